@@ -1,0 +1,82 @@
+// Rect and RectF: axis-aligned rectangles in pixels, y down. Right and bottom are exclusive for integers.
+// The members keep the order left, top, right, bottom; nothing sorts them, so a width can be negative.
+#pragma once
+
+#include "moka/base/Export.h"
+#include "moka/base/Point.h"
+
+namespace Moka {
+
+class RectF;
+
+class MOKA_API Rect {
+public:
+    int left = 0;
+    int top = 0;
+    int right = 0;
+    int bottom = 0;
+
+    constexpr Rect() = default;
+    constexpr Rect(int l, int t, int r, int b) : left(l), top(t), right(r), bottom(b) {}
+
+    // The smallest integer rectangle around r: left and top rounded down, right and bottom up, each saturated
+    // to the range of int. A NaN edge becomes 0.
+    explicit Rect(RectF const& r);
+    Rect& operator=(RectF const& r);
+
+    int GetWidth() const;  // right - left, saturated
+    int GetHeight() const; // bottom - top, saturated
+    bool IsEmpty() const;  // width or height is not positive
+
+    bool Contains(Point const& p) const; // left <= x < right and top <= y < bottom
+
+    // Whether the two share at least one pixel.
+    bool IsIntersect(Rect const& other) const;
+    // The shared pixels; a default (all zero) rectangle when there are none.
+    Rect Intersect(Rect const& other) const;
+
+    friend constexpr bool operator==(Rect const& a, Rect const& b) {
+        return a.left == b.left && a.top == b.top && a.right == b.right && a.bottom == b.bottom;
+    }
+    friend constexpr bool operator!=(Rect const& a, Rect const& b) { return !(a == b); }
+};
+
+class MOKA_API RectF {
+public:
+    float left = 0;
+    float top = 0;
+    float right = 0;
+    float bottom = 0;
+
+    constexpr RectF() = default;
+    constexpr RectF(float l, float t, float r, float b) : left(l), top(t), right(r), bottom(b) {}
+    explicit RectF(Rect const& r);
+
+    void Set(float l, float t, float r, float b);
+
+    float GetWidth() const { return right - left; }
+    float GetHeight() const { return bottom - top; }
+    bool IsEmpty() const; // width or height is not positive, or not a number
+
+    // Grows the rectangle so that it contains (x, y); start from a degenerate rectangle at the first point.
+    // A coordinate that is NaN changes nothing.
+    void MakeRect(float x, float y);
+
+    // Rounds outwards to whole numbers: left and top down, right and bottom up.
+    void ExtendRect();
+
+    // Moves every edge outwards by the given distances (inwards when negative).
+    void IncreaseRect(float dx, float dy);
+
+    // Per axis, with lo the greater of the low edges and hi the lesser of the high ones: overlap when lo <
+    // hi, or when lo == hi and one of the two has no extent on that axis. So horizontal and vertical lines
+    // count, a full rectangle that ends exactly on the other's edge does not. NaN never intersects.
+    bool IsIntersect(RectF const& other) const;
+
+    friend constexpr bool operator==(RectF const& a, RectF const& b) {
+        return a.left == b.left && a.top == b.top && a.right == b.right && a.bottom == b.bottom;
+    }
+    friend constexpr bool operator!=(RectF const& a, RectF const& b) { return !(a == b); }
+};
+
+} // namespace Moka

@@ -1,0 +1,47 @@
+// RefPtr: holds one reference on an object with Ref() and Unref().
+// Adopting takes over a reference that the caller already has; sharing takes one more.
+#pragma once
+
+#include <utility>
+
+namespace Moka {
+
+template <class T>
+class RefPtr {
+public:
+    RefPtr() noexcept = default;
+    RefPtr(RefPtr const& other) : mObject(other.mObject) {
+        if (mObject) mObject->Ref();
+    }
+    RefPtr(RefPtr&& other) noexcept : mObject(std::exchange(other.mObject, nullptr)) {}
+    RefPtr& operator=(RefPtr other) noexcept {
+        std::swap(mObject, other.mObject);
+        return *this;
+    }
+    ~RefPtr() {
+        if (mObject) mObject->Unref();
+    }
+
+    static RefPtr Adopt(T* object) noexcept {
+        RefPtr pointer;
+        pointer.mObject = object;
+        return pointer;
+    }
+    static RefPtr Share(T* object) {
+        if (object) object->Ref();
+        return Adopt(object);
+    }
+
+    T* Get() const noexcept { return mObject; }
+    T* operator->() const noexcept { return mObject; }
+    T& operator*() const noexcept { return *mObject; }
+    explicit operator bool() const noexcept { return mObject != nullptr; }
+
+    // Gives the reference up to the caller.
+    [[nodiscard]] T* Release() noexcept { return std::exchange(mObject, nullptr); }
+
+private:
+    T* mObject = nullptr;
+};
+
+} // namespace Moka

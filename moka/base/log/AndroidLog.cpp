@@ -1,0 +1,114 @@
+#include "moka/base/log/AndroidLog.h"
+
+#include "moka/base/log/LogSink.h"
+
+#include <atomic>
+#include <cstdarg>
+#include <cstdio>
+#include <mutex>
+#include <string>
+#include <utility>
+
+namespace Moka {
+namespace {
+
+// Recursive, so that a sink that logs does not wait for itself; the depth sends its line to stderr.
+struct SinkSlot {
+    std::recursive_mutex mutex;
+    LogSink sink;
+    int depth = 0;
+};
+
+// Never destroyed: destructors of other statics log.
+SinkSlot& Slot() {
+    static SinkSlot& slot = *new SinkSlot;
+    return slot;
+}
+
+std::atomic<int> lowestPriority{ANDROID_LOG_INFO};
+
+char LevelOf(int priority) {
+    switch (priority) {
+    case ANDROID_LOG_DEBUG:
+        return 'D';
+    case ANDROID_LOG_INFO:
+        return 'I';
+    case ANDROID_LOG_WARN:
+        return 'W';
+    case ANDROID_LOG_ERROR:
+        return 'E';
+    case ANDROID_LOG_FATAL:
+        return 'F';
+    default:
+        return 'V';
+    }
+}
+
+std::string Format(char const* format, va_list arguments) {
+    va_list again;
+    va_copy(again, arguments);
+    int const length = std::vsnprintf(nullptr, 0, format, arguments);
+    std::string text(length > 0 ? static_cast<std::size_t>(length) : 0, '\0');
+    if (length > 0) std::vsnprintf(text.data(), text.size() + 1, format, again);
+    va_end(again);
+    return text;
+}
+
+bool GiveToSink(LogLine const& line) {
+    SinkSlot& slot = Slot();
+    std::lock_guard<std::recursive_mutex> const lock(slot.mutex);
+    if (!slot.sink || slot.depth > 0) return false;
+    LogSink const sink = slot.sink; // the sink may replace itself
+    ++slot.depth;
+    bool taken = true;
+    try {
+        sink(line);
+    } catch (...) {
+        taken = false; // whoever logs expects no exception, so the line goes where it is seen
+    }
+    --slot.depth;
+    return taken;
+}
+
+int WriteToStderr(LogLine const& line) {
+    std::string whole;
+    whole.reserve(line.tag.size() + line.text.size() + 5);
+    whole.append(1, LevelOf(line.priority)).append(1, ' ').append(line.tag).append(": ");
+    whole.append(line.text).append(1, '\n');
+    // One call, since stderr is not buffered: what is formatted into it can reach the file in pieces.
+    return static_cast<int>(std::fwrite(whole.data(), 1, whole.size(), stderr));
+}
+
+int Print(int priority, char const* tag, char const* format, va_list arguments) {
+    LogLine const line{priority, tag, format, Format(format, arguments)};
+    if (GiveToSink(line)) return static_cast<int>(line.text.size());
+    return priority < lowestPriority ? 0 : WriteToStderr(line);
+}
+
+} // namespace
+
+LogSink SetLogSink(LogSink sink) {
+    SinkSlot& slot = Slot();
+    std::lock_guard<std::recursive_mutex> lock(slot.mutex);
+    std::swap(slot.sink, sink);
+    return sink;
+}
+
+void SetLogPriority(int lowest) { lowestPriority = lowest; }
+
+} // namespace Moka
+
+extern "C" int __android_log_print(int priority, char const* tag, char const* format, ...) {
+    if (!tag) tag = "(null)";
+    if (!format) format = "(null)";
+    va_list arguments;
+    va_start(arguments, format);
+    int written = 0;
+    try {
+        written = Moka::Print(priority, tag, format, arguments);
+    } catch (...) { // out of memory: what needs none
+        written = std::fprintf(stderr, "%c %s: %s\n", Moka::LevelOf(priority), tag, format);
+    }
+    va_end(arguments);
+    return written;
+}

@@ -1,0 +1,103 @@
+#include "moka/base/Bitmap.h"
+
+#include "tests/unit/base/Allocation.h"
+
+#include <gtest/gtest.h>
+
+#include <limits>
+#include <memory>
+#include <vector>
+
+namespace Moka {
+namespace {
+
+unsigned char* NewPixels(int bytes) {
+    auto* const pixels = new unsigned char[static_cast<std::size_t>(bytes)];
+    for (int i = 0; i < bytes; ++i) pixels[i] = static_cast<unsigned char>(i);
+    return pixels;
+}
+
+TEST(BitmapTest, FreesTheBufferWithArrayDeleteOnlyWhileTheSwitchIsOn) {
+    struct Case {
+        bool constructWith;
+        bool switchedTo;
+        int deletes;
+    };
+    for (Case const& c : {Case{true, true, 1}, Case{true, false, 0}, Case{false, true, 1}}) {
+        unsigned char* const pixels = NewPixels(2 * 3 * 4);
+        test::DeleteWatch const watch(pixels);
+        {
+            Bitmap bitmap;
+            ASSERT_TRUE(bitmap.Construct(pixels, 2, 3, 8, 1, false, c.constructWith));
+            EXPECT_EQ(bitmap.GetDeleteBuffer(), c.constructWith);
+            EXPECT_EQ(bitmap.GetBuffer(), pixels);
+            bitmap.SetDeleteBuffer(c.switchedTo);
+        }
+        EXPECT_EQ(watch.GetArrayDeletes(), c.deletes);
+        EXPECT_EQ(watch.GetPlainDeletes(), 0);
+        if (c.deletes == 0) delete[] pixels;
+    }
+}
+
+TEST(BitmapTest, CopyIsOwnedAndTightAndLeavesTheSourceToTheCaller) {
+    // Two rows at stride 12; the buffer ends with the last pixel, not with a whole stride.
+    std::unique_ptr<unsigned char[]> const pixels(NewPixels(12 + 8));
+    unsigned char* copy = nullptr;
+    {
+        Bitmap bitmap;
+        ASSERT_TRUE(bitmap.Construct(pixels.get(), 2, 2, 12, 1, true, false));
+        copy = bitmap.GetBuffer();
+        ASSERT_NE(copy, pixels.get());
+        EXPECT_EQ(bitmap.GetStride(), 8);
+        EXPECT_TRUE(bitmap.GetDeleteBuffer());
+        EXPECT_EQ(std::vector<unsigned char>(copy, copy + 16),
+                  (std::vector<unsigned char>{0, 1, 2, 3, 4, 5, 6, 7, 12, 13, 14, 15, 16, 17, 18, 19}));
+    }
+    test::DeleteWatch const watch(pixels.get());
+    {
+        Bitmap bitmap;
+        ASSERT_TRUE(bitmap.Construct(pixels.get(), 2, 2, 12, 1, true, true));
+    }
+    EXPECT_EQ(watch.GetArrayDeletes(), 0);
+}
+
+TEST(BitmapTest, RefusesBadArgumentsAndStaysUsable) {
+    std::unique_ptr<unsigned char[]> const pixels(NewPixels(16));
+    struct Case {
+        bool buffer;
+        int width, height, stride, format;
+    };
+    int const max = std::numeric_limits<int>::max();
+    Bitmap bitmap;
+    for (Case const& c :
+         {Case{false, 2, 2, 8, 1}, Case{true, 0, 2, 8, 1}, Case{true, 2, 0, 8, 1}, Case{true, -2, 2, 8, 1},
+          Case{true, 2, -2, 8, 1}, Case{true, 2, 2, 7, 1}, Case{true, 2, 2, -8, 1}, Case{true, 2, 2, 8, 0},
+          Case{true, 2, 2, 8, 2}, Case{true, 1 << 30, 1, 0, 1}, Case{true, max, 1, max, 1}}) {
+        EXPECT_FALSE(bitmap.Construct(c.buffer ? pixels.get() : nullptr, c.width, c.height, c.stride,
+                                      c.format, false, true))
+            << c.width << 'x' << c.height << " stride " << c.stride << " format " << c.format;
+        EXPECT_EQ(bitmap.GetBuffer(), nullptr);
+    }
+    ASSERT_TRUE(bitmap.Construct(pixels.get(), 2, 2, 8, 1, false, false));
+    std::unique_ptr<unsigned char[]> const second(NewPixels(4));
+    EXPECT_FALSE(bitmap.Construct(second.get(), 1, 1, 4, 1, false, true)) << "has pixels already";
+    EXPECT_EQ(bitmap.GetBuffer(), pixels.get());
+    EXPECT_EQ(bitmap.GetWidth(), 2);
+    EXPECT_FALSE(bitmap.GetDeleteBuffer());
+}
+
+TEST(BitmapTest, ACopyThatCannotBeAllocatedIsRefused) {
+    std::unique_ptr<unsigned char[]> const pixels(NewPixels(16));
+    Bitmap bitmap;
+    bool constructed = true;
+    {
+        test::FailAllocations const fail;
+        constructed = bitmap.Construct(pixels.get(), 2, 2, 8, 1, true, false);
+    }
+    EXPECT_FALSE(constructed);
+    EXPECT_EQ(bitmap.GetBuffer(), nullptr);
+    EXPECT_TRUE(bitmap.Construct(pixels.get(), 2, 2, 8, 1, true, false));
+}
+
+} // namespace
+} // namespace Moka

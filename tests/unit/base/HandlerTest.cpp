@@ -1,0 +1,348 @@
+#include "moka/base/Handler.h"
+#include "moka/base/MessageLoop.h"
+
+#include "moka/base/log/LogSink.h"
+#include "tests/unit/base/Allocation.h"
+
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+
+#include <atomic>
+#include <chrono>
+#include <functional>
+#include <memory>
+#include <optional>
+#include <stdexcept>
+#include <thread>
+#include <vector>
+
+namespace Moka {
+namespace {
+
+using testing::ElementsAre;
+using testing::IsEmpty;
+
+// A handler whose messages call a closure; it keeps what arrived.
+class Receiver {
+public:
+    using Action = std::function<void(Handler*, int)>;
+
+    explicit Receiver(Action action = nullptr)
+        : mAction(std::move(action)), mHandler(std::make_unique<Handler>(&Receive, this)) {}
+
+    Handler* operator->() const { return mHandler.get(); }
+    // Safe inside its own message, unlike destroying the receiver.
+    void DestroyHandler() { mHandler.reset(); }
+    std::vector<int> const& GetReceived() const { return mReceived; }
+
+private:
+    static void Receive(Handler* handler, void* argument, int what) {
+        auto* const self = static_cast<Receiver*>(argument);
+        self->mReceived.push_back(what);
+        if (self->mAction) self->mAction(handler, what);
+    }
+
+    Action mAction;
+    std::vector<int> mReceived;
+    std::unique_ptr<Handler> mHandler;
+};
+
+class HandlerTest : public testing::Test {
+protected:
+    HandlerTest() {
+        SetLogSink([this](LogLine const& line) { mLines.push_back(line.text); });
+    }
+    ~HandlerTest() override { SetLogSink(nullptr); }
+
+    std::vector<std::string> mLines;
+};
+
+TEST_F(HandlerTest, MessagesOfAllHandlersRunInTheOrderTheyWereSent) {
+    MessageLoop loop;
+    EXPECT_EQ(MessageLoop::GetCurrent(), &loop);
+    std::vector<std::pair<char, int>> order;
+    Receiver const a([&](Handler*, int what) { order.emplace_back('a', what); });
+    Receiver const b([&](Handler*, int what) { order.emplace_back('b', what); });
+    EXPECT_TRUE(a->SendMessage(1));
+    EXPECT_TRUE(b->SendMessage(1));
+    EXPECT_TRUE(a->SendMessage());
+    EXPECT_TRUE(order.empty()) << "only the loop runs messages";
+    EXPECT_EQ(loop.RunPending(), 3);
+    EXPECT_THAT(order, ElementsAre(std::make_pair('a', 1), std::make_pair('b', 1), std::make_pair('a', 0)));
+    EXPECT_EQ(loop.RunPending(), 0);
+}
+
+TEST_F(HandlerTest, HasMessageMeansWaitingToRun) {
+    MessageLoop loop;
+    Receiver const other;
+    std::optional<bool> whileRunning;
+    Receiver const coalesced([&](Handler* handler, int) { whileRunning = handler->HasMessage(); });
+    EXPECT_FALSE(coalesced->HasMessage());
+    coalesced->SendMessage();
+    EXPECT_TRUE(coalesced->HasMessage());
+    EXPECT_FALSE(coalesced->HasMessage(5));
+    EXPECT_FALSE(other->HasMessage()) << "another handler's message";
+    loop.RunPending();
+    EXPECT_EQ(whileRunning, false) << "a result that arrives now needs a new message";
+    EXPECT_FALSE(coalesced->HasMessage());
+}
+
+TEST_F(HandlerTest, WithoutALoopEveryMessageIsRefused) {
+    ASSERT_EQ(MessageLoop::GetCurrent(), nullptr);
+    Receiver const orphan;
+    EXPECT_EQ(mLines.size(), 1U);
+    MessageLoop loop; // too late
+    EXPECT_FALSE(orphan->SendMessage());
+    EXPECT_FALSE(orphan->HasMessage());
+    EXPECT_EQ(loop.RunPending(), 0);
+}
+
+TEST_F(HandlerTest, TheLoopMayGoFirst) {
+    auto loop = std::make_unique<MessageLoop>();
+    Receiver receiver;
+    EXPECT_TRUE(receiver->SendMessage());
+    loop.reset();
+    EXPECT_EQ(MessageLoop::GetCurrent(), nullptr);
+    EXPECT_FALSE(receiver->HasMessage());
+    EXPECT_FALSE(receiver->SendMessage());
+    MessageLoop next; // a new loop on the same thread does not adopt it
+    EXPECT_FALSE(receiver->SendMessage());
+    EXPECT_THAT(receiver.GetReceived(), IsEmpty());
+}
+
+TEST_F(HandlerTest, DestructionWithdrawsItsOwnPendingMessages) {
+    MessageLoop loop;
+    Receiver const kept;
+    Receiver gone;
+    for (int i = 0; i < 3; ++i) {
+        gone->SendMessage(i);
+        kept->SendMessage(i);
+    }
+    gone.DestroyHandler();
+    EXPECT_EQ(loop.RunPending(), 3);
+    EXPECT_THAT(kept.GetReceived(), ElementsAre(0, 1, 2));
+    EXPECT_THAT(gone.GetReceived(), IsEmpty());
+}
+
+TEST_F(HandlerTest, AMessageMayDestroyItsOwnHandlerAndOthers) {
+    MessageLoop loop;
+    Receiver other;
+    Receiver* self = nullptr;
+    Receiver receiver([&](Handler*, int) {
+        self->DestroyHandler();
+        other.DestroyHandler();
+    });
+    self = &receiver;
+    receiver->SendMessage(1);
+    receiver->SendMessage(2);
+    other->SendMessage(3);
+    EXPECT_EQ(loop.RunPending(), 1);
+    EXPECT_THAT(receiver.GetReceived(), ElementsAre(1));
+    EXPECT_THAT(other.GetReceived(), IsEmpty());
+}
+
+TEST_F(HandlerTest, RunPendingLeavesWhatIsSentMeanwhile) {
+    MessageLoop loop;
+    Receiver victim;
+    Receiver const receiver([&](Handler* handler, int what) {
+        handler->SendMessage(what + 10);
+        if (what == 1) victim.DestroyHandler(); // a withdrawn message is not made up for
+    });
+    receiver->SendMessage(1);
+    victim->SendMessage(2);
+    receiver->SendMessage(3);
+    EXPECT_EQ(loop.RunPending(), 2);
+    EXPECT_THAT(receiver.GetReceived(), ElementsAre(1, 3));
+    EXPECT_EQ(loop.RunPending(), 2);
+    EXPECT_THAT(receiver.GetReceived(), ElementsAre(1, 3, 11, 13));
+}
+
+TEST_F(HandlerTest, AMessageMayRunTheLoopAndAnInnerOneMayDestroyTheOuterHandler) {
+    MessageLoop loop;
+    Receiver* outer = nullptr;
+    Receiver const inner([&](Handler*, int) { outer->DestroyHandler(); });
+    std::vector<int> counts;
+    Receiver receiver([&](Handler*, int) { counts.push_back(loop.RunPending()); });
+    outer = &receiver;
+    receiver->SendMessage();
+    inner->SendMessage();
+    receiver->SendMessage();
+    EXPECT_EQ(loop.RunPending(), 1) << "the other one ran inside the first";
+    EXPECT_THAT(counts, ElementsAre(1));
+}
+
+TEST_F(HandlerTest, QuitEndsTheRunningOrTheNextRun) {
+    MessageLoop loop;
+    Receiver const receiver([&](Handler*, int what) {
+        if (what == 1) loop.Quit();
+    });
+    loop.Quit();
+    receiver->SendMessage(0);
+    loop.Run();
+    EXPECT_THAT(receiver.GetReceived(), IsEmpty()) << "asked for before it ran";
+    receiver->SendMessage(1);
+    receiver->SendMessage(2);
+    loop.Run();
+    EXPECT_THAT(receiver.GetReceived(), ElementsAre(0, 1));
+    EXPECT_EQ(loop.RunPending(), 1) << "what it left can still run";
+}
+
+TEST_F(HandlerTest, AThrowingMessageIsOneErrorLine) {
+    MessageLoop loop;
+    Receiver const receiver([](Handler*, int what) {
+        if (what == 1) throw std::runtime_error("no paper");
+        if (what == 2) throw 2;
+    });
+    for (int what = 1; what <= 3; ++what) receiver->SendMessage(what);
+    EXPECT_EQ(loop.RunPending(), 3);
+    ASSERT_EQ(mLines.size(), 2U);
+    EXPECT_NE(mLines[0].find("no paper"), std::string::npos);
+}
+
+TEST_F(HandlerTest, WithoutMemoryMessagesAreRefused) {
+    MessageLoop loop;
+    Receiver const receiver;
+    int sent = 0;
+    std::optional<Handler> handler;
+    {
+        test::FailAllocations const fail;
+        handler.emplace([](Handler*, void*, int) {}, nullptr);
+        while (receiver->SendMessage(sent)) ++sent; // the queue has room for some
+    }
+    EXPECT_FALSE(handler->SendMessage());
+    EXPECT_EQ(loop.RunPending(), sent);
+    EXPECT_TRUE(receiver->SendMessage(-1));
+    EXPECT_EQ(loop.RunPending(), 1);
+}
+
+// A loop on a thread of its own, running until the object goes.
+class LoopThread {
+public:
+    explicit LoopThread(std::function<void()> setUp = nullptr) {
+        mThread = std::thread([this, setUp] {
+            MessageLoop loop;
+            if (setUp) setUp();
+            mLoop = &loop;
+            loop.Run();
+        });
+        while (!mLoop) std::this_thread::yield();
+    }
+    ~LoopThread() { Stop(); }
+    LoopThread(LoopThread const&) = delete;
+    LoopThread& operator=(LoopThread const&) = delete;
+
+    void Stop() {
+        if (!mThread.joinable()) return;
+        mLoop.load()->Quit();
+        mThread.join();
+    }
+    std::thread::id GetId() const { return mThread.get_id(); }
+
+private:
+    std::atomic<MessageLoop*> mLoop{nullptr};
+    std::thread mThread;
+};
+
+TEST_F(HandlerTest, EveryThreadsMessagesArriveOnceAndInOrderOnTheLoopsThread) {
+    constexpr int kSenders = 4;
+    constexpr int kMessages = 2000;
+    std::unique_ptr<Receiver> receiver;
+    std::atomic<int> arrived{0};
+    std::atomic<bool> elsewhere{false};
+    LoopThread* loop = nullptr;
+    LoopThread running([&] {
+        receiver = std::make_unique<Receiver>([&](Handler*, int) {
+            elsewhere = elsewhere || std::this_thread::get_id() != loop->GetId();
+            ++arrived;
+        });
+    });
+    loop = &running;
+    std::vector<std::thread> senders;
+    for (int s = 0; s < kSenders; ++s) {
+        senders.emplace_back([&, s] {
+            for (int i = 0; i < kMessages; ++i) {
+                if (i % 100 == 0) std::this_thread::yield(); // lets the loop fall asleep now and then
+                EXPECT_TRUE((*receiver)->SendMessage(s * kMessages + i));
+            }
+        });
+    }
+    for (std::thread& sender : senders) sender.join();
+    while (arrived < kSenders * kMessages) std::this_thread::yield();
+    running.Stop();
+    EXPECT_FALSE(elsewhere);
+    int next[kSenders] = {};
+    for (int const what : receiver->GetReceived()) ASSERT_EQ(what % kMessages, next[what / kMessages]++);
+}
+
+TEST_F(HandlerTest, DestructionElsewhereWaitsForTheRunningMessage) {
+    std::unique_ptr<Receiver> receiver;
+    std::atomic<bool> entered{false};
+    std::atomic<bool> destroyed{false};
+    bool finished = false; // not atomic: the destructor's waiting is what makes it visible
+    bool refused = false;
+    LoopThread loop([&] {
+        receiver = std::make_unique<Receiver>([&](Handler* handler, int) {
+            entered = true;
+            // Ends only when destruction has begun, which closes the handler.
+            while (handler->SendMessage(1)) std::this_thread::yield();
+            refused = true;
+            std::this_thread::sleep_for(std::chrono::milliseconds(20));
+            EXPECT_FALSE(destroyed);
+            finished = true;
+        });
+    });
+    (*receiver)->SendMessage(0);
+    while (!entered) std::this_thread::yield();
+    receiver->DestroyHandler();
+    destroyed = true;
+    EXPECT_TRUE(finished);
+    EXPECT_TRUE(refused);
+    loop.Stop();
+    EXPECT_THAT(receiver->GetReceived(), ElementsAre(0));
+}
+
+TEST_F(HandlerTest, HandlersMayComeAndGoWhileTheLoopIsBusy) {
+    constexpr int kRounds = 300;
+    for (int round = 0; round < kRounds; ++round) {
+        auto count = std::make_unique<std::atomic<int>>(0);
+        std::unique_ptr<Handler> handler;
+        LoopThread loop([&] {
+            handler = std::make_unique<Handler>(
+                [](Handler*, void* argument, int) { ++*static_cast<std::atomic<int>*>(argument); },
+                count.get());
+        });
+        for (int i = 0; i < 20; ++i) handler->SendMessage(i);
+        if (round % 3 == 0) loop.Stop(); // the loop goes first
+        handler.reset();
+        count.reset(); // a message that still ran would touch it
+    }
+}
+
+struct OneShot {
+    std::unique_ptr<Handler> handler;
+    std::atomic<bool>* done = nullptr;
+};
+
+// The message can destroy the handler while the sender is still inside SendMessage.
+TEST_F(HandlerTest, AHandlerMayBeDestroyedByTheMessageBeingSent) {
+    for (int round = 0; round < 300; ++round) {
+        std::atomic<bool> done{false};
+        auto* shot = new OneShot;
+        shot->done = &done;
+        LoopThread const loop([&] {
+            shot->handler = std::make_unique<Handler>(
+                [](Handler*, void* argument, int) {
+                    std::unique_ptr<OneShot> const own(static_cast<OneShot*>(argument));
+                    own->handler.reset();
+                    *own->done = true;
+                },
+                shot);
+        });
+        Handler* const handler = shot->handler.get();
+        EXPECT_TRUE(handler->SendMessage());
+        while (!done) std::this_thread::yield();
+    }
+}
+
+} // namespace
+} // namespace Moka

@@ -1,0 +1,119 @@
+#include "moka/base/List.h"
+
+#include "tests/unit/base/Allocation.h"
+
+#include <gtest/gtest.h>
+
+#include <algorithm>
+#include <deque>
+#include <random>
+#include <vector>
+
+namespace Moka {
+namespace {
+
+void ExpectSame(List<int> const& list, std::deque<int*> const& model) {
+    ASSERT_EQ(list.GetCount(), static_cast<int>(model.size()));
+    EXPECT_EQ(list.IsEmpty(), model.empty());
+    for (int i = 0; i < list.GetCount(); ++i) {
+        ASSERT_EQ(list.GetAt(i), model[static_cast<std::size_t>(i)]) << i;
+    }
+    EXPECT_EQ(list.GetAt(-1), nullptr);
+    EXPECT_EQ(list.GetAt(list.GetCount()), nullptr);
+}
+
+// Removals prefer the front, as a queue's do, so that the storage is compacted at many fill levels.
+void Mutate(List<int>& list, std::deque<int*>& model, int* item, int choice) {
+    int const count = static_cast<int>(model.size());
+    if (choice < 50) {
+        ASSERT_TRUE(list.Add(item));
+        model.push_back(item);
+    } else if (choice < 80) {
+        EXPECT_EQ(list.RemoveAt(0), model.empty() ? nullptr : model.front());
+        if (!model.empty()) model.pop_front();
+    } else if (choice < 90 && count > 0) {
+        int const index = choice * 7919 % count;
+        EXPECT_EQ(list.RemoveAt(index), model[static_cast<std::size_t>(index)]);
+        model.erase(model.begin() + index);
+    } else if (choice < 99) {
+        auto const at = std::find(model.begin(), model.end(), item);
+        EXPECT_EQ(list.Remove(item), at != model.end());
+        if (at != model.end()) model.erase(at);
+    } else {
+        list.Clear();
+        model.clear();
+    }
+}
+
+TEST(ListTest, BehavesLikeAPlainSequenceUnderRandomUse) {
+    std::vector<int> objects(8); // few, so that duplicates are common
+    std::mt19937 random(7);
+    List<int> list;
+    ASSERT_TRUE(list.Construct());
+    std::deque<int*> model;
+    for (int step = 0; step < 5000; ++step) {
+        Mutate(list, model, &objects[random() % objects.size()], static_cast<int>(random() % 100));
+        ExpectSame(list, model);
+        if (HasFatalFailure()) FAIL() << "at step " << step;
+    }
+}
+
+TEST(ListTest, DrainsALongQueueFromEitherEndWithoutAllocating) {
+    constexpr int kCount = 100'000;
+    std::vector<int> objects(kCount);
+    List<int> list;
+    for (int& object : objects) ASSERT_TRUE(list.Add(&object));
+    int const before = test::GetAllocationCount();
+    bool inOrder = true;
+    for (int i = 0; i < kCount / 2; ++i) {
+        inOrder = inOrder && list.RemoveAt(0) == &objects[static_cast<std::size_t>(i)];
+        inOrder = inOrder &&
+                  list.RemoveAt(list.GetCount() - 1) == &objects[static_cast<std::size_t>(kCount - 1 - i)];
+    }
+    EXPECT_EQ(test::GetAllocationCount(), before);
+    EXPECT_TRUE(inOrder);
+    EXPECT_TRUE(list.IsEmpty());
+    EXPECT_EQ(list.RemoveAt(0), nullptr);
+}
+
+TEST(ListTest, AQueueInSteadyUseKeepsItsStorage) {
+    std::vector<int> objects(16);
+    List<int> list;
+    for (int& object : objects) ASSERT_TRUE(list.Add(&object));
+    int warm = 0;
+    for (int round = 0; round < 1000; ++round) {
+        if (round == 100) warm = test::GetAllocationCount();
+        for (int& object : objects) {
+            ASSERT_TRUE(list.Add(&object));
+            ASSERT_EQ(list.RemoveAt(0), &object);
+        }
+    }
+    EXPECT_EQ(test::GetAllocationCount(), warm);
+}
+
+TEST(ListTest, RefusesAnItemItHasNoMemoryForAndKeepsTheRest) {
+    int first = 0;
+    int second = 0;
+    int const before = test::GetAllocationCount();
+    List<int> list;
+    EXPECT_EQ(test::GetAllocationCount(), before) << "an empty list allocates nothing";
+    bool added = true;
+    {
+        test::FailAllocations const fail;
+        added = list.Add(&first);
+    }
+    EXPECT_FALSE(added);
+    EXPECT_TRUE(list.IsEmpty());
+    ASSERT_TRUE(list.Add(&first));
+    int accepted = 0;
+    {
+        test::FailAllocations const fail;
+        while (list.Add(&second)) ++accepted; // until the storage it has is full
+    }
+    EXPECT_EQ(list.GetCount(), 1 + accepted);
+    EXPECT_EQ(list.GetAt(0), &first);
+    EXPECT_TRUE(list.Add(&second));
+}
+
+} // namespace
+} // namespace Moka

@@ -1,0 +1,177 @@
+#include "moka/base/Rect.h"
+
+#include <gtest/gtest.h>
+
+#include <cmath>
+#include <limits>
+#include <random>
+#include <vector>
+
+namespace Moka {
+namespace {
+
+constexpr int kMin = std::numeric_limits<int>::min();
+constexpr int kMax = std::numeric_limits<int>::max();
+constexpr float kNan = std::numeric_limits<float>::quiet_NaN();
+constexpr float kInf = std::numeric_limits<float>::infinity();
+
+TEST(RectTest, SizesAreSaturated) {
+    EXPECT_EQ(Rect(kMin, kMin, kMax, 0).GetWidth(), kMax);
+    EXPECT_EQ(Rect(kMin, kMin, kMax, 0).GetHeight(), kMax);
+    EXPECT_EQ(Rect(kMax, 1, kMin, kMin).GetWidth(), kMin);
+    EXPECT_EQ(Rect(kMax, 1, kMin, kMin).GetHeight(), kMin);
+    EXPECT_EQ(Rect(-3, 5, 4, 2).GetWidth(), 7);
+    EXPECT_EQ(Rect(-3, 5, 4, 2).GetHeight(), -3);
+    EXPECT_FALSE(Rect(kMin, kMin, kMax, kMax).IsEmpty());
+    EXPECT_TRUE(Rect(kMax, 0, kMin, 1).IsEmpty());
+    EXPECT_TRUE(Rect(0, 0, 0, 5).IsEmpty());
+    EXPECT_TRUE(Rect(0, 0, 5, 0).IsEmpty());
+}
+
+TEST(RectTest, ContainsIsHalfOpen) {
+    Rect const r(-1, 2, 3, 4);
+    EXPECT_TRUE(r.Contains({-1, 2}));
+    EXPECT_TRUE(r.Contains({2, 3}));
+    EXPECT_FALSE(r.Contains({3, 3}));
+    EXPECT_FALSE(r.Contains({2, 4}));
+    EXPECT_FALSE(r.Contains({-2, 2}));
+    EXPECT_FALSE(r.Contains({-1, 1}));
+    EXPECT_TRUE(Rect(kMin, kMin, kMax, kMax).Contains({kMin, kMax - 1}));
+    EXPECT_FALSE(Rect(3, 4, -1, 2).Contains({0, 3}));
+}
+
+std::vector<Rect> AllRects(int low, int high) {
+    std::vector<Rect> all;
+    for (int l = low; l <= high; ++l)
+        for (int t = low; t <= high; ++t)
+            for (int r = low; r <= high; ++r)
+                for (int b = low; b <= high; ++b) all.emplace_back(l, t, r, b);
+    return all;
+}
+
+TEST(RectTest, IntersectIsExactlyTheSharedPixels) {
+    std::vector<Rect> const all = AllRects(0, 3); // empty and turned ones too
+    for (Rect const& a : all) {
+        for (Rect const& b : all) {
+            Rect const shared = a.Intersect(b);
+            bool any = false;
+            for (int y = 0; y < 3; ++y) {
+                for (int x = 0; x < 3; ++x) {
+                    bool const both = a.Contains({x, y}) && b.Contains({x, y});
+                    any = any || both;
+                    ASSERT_EQ(shared.Contains({x, y}), both);
+                }
+            }
+            ASSERT_EQ(a.IsIntersect(b), any);
+            ASSERT_EQ(shared == Rect(), !any);
+        }
+    }
+}
+
+TEST(RectTest, ConversionEnclosesAndSaturates) {
+    EXPECT_EQ(Rect(RectF(0.5f, -0.5f, 1.5f, -0.25f)), Rect(0, -1, 2, 0));
+    EXPECT_EQ(Rect(RectF(-2, -3, 4, 5)), Rect(-2, -3, 4, 5));
+    EXPECT_EQ(Rect(RectF(-kInf, -3e9f, kInf, 3e9f)), Rect(kMin, kMin, kMax, kMax));
+    EXPECT_EQ(Rect(RectF(2147483648.0f, 2147483520.0f, -2147483648.0f, -2147483904.0f)),
+              Rect(kMax, 2147483520, kMin, kMin));
+    EXPECT_EQ(Rect(RectF(kNan, 1.5f, kNan, kNan)), Rect(0, 1, 0, 0));
+    Rect assigned(9, 9, 9, 9);
+    assigned = RectF(-1.25f, 0, 0.001f, 1);
+    EXPECT_EQ(assigned, Rect(-2, 0, 1, 1));
+}
+
+TEST(RectTest, ConversionIsTheSmallestEnclosingOne) {
+    std::mt19937 random(11);
+    std::uniform_real_distribution<float> exponent(-8, 30);
+    for (int i = 0; i < 20000; ++i) {
+        float const v = std::exp2(exponent(random)) * (random() % 2 == 0 ? 1.0f : -1.0f);
+        Rect const r(RectF(v, v, v, v));
+        ASSERT_LE(double{v} - 1, r.left);
+        ASSERT_LE(r.left, double{v}) << v;
+        ASSERT_LE(double{v}, r.right) << v;
+        ASSERT_GE(double{v} + 1, r.right);
+        ASSERT_EQ(Rect(r.left, r.left, r.right, r.right), r);
+    }
+}
+
+TEST(RectFTest, GrowsFromAPointAndIgnoresNan) {
+    RectF r;
+    r.Set(3, 4, 3, 4);
+    EXPECT_TRUE(r.IsEmpty());
+    r.MakeRect(1, 7);
+    EXPECT_EQ(r, RectF(1, 4, 3, 7));
+    r.MakeRect(2, 5); // inside
+    EXPECT_EQ(r, RectF(1, 4, 3, 7));
+    r.MakeRect(9, kNan);
+    EXPECT_EQ(r, RectF(1, 4, 9, 7));
+    r.MakeRect(kNan, -1);
+    EXPECT_EQ(r, RectF(1, -1, 9, 7));
+}
+
+TEST(RectFTest, RoundsOutwardsAndMovesEveryEdge) {
+    RectF r(-0.5f, 0.25f, 1.25f, -0.25f);
+    r.ExtendRect();
+    EXPECT_EQ(r, RectF(-1, 0, 2, 0));
+    r.Set(-kInf, 1e20f, kInf, 2e20f);
+    r.ExtendRect();
+    EXPECT_EQ(r, RectF(-kInf, 1e20f, kInf, 2e20f));
+    r.Set(10, 20, 30, 40);
+    r.IncreaseRect(1, 2);
+    EXPECT_EQ(r, RectF(9, 18, 31, 42));
+    r.IncreaseRect(-11, -2);
+    EXPECT_EQ(r, RectF(20, 20, 20, 40));
+}
+
+TEST(RectFTest, IsEmptyUnlessBothSidesArePositive) {
+    EXPECT_FALSE(RectF(0, 0, 1e-45f, 1e-45f).IsEmpty());
+    EXPECT_FALSE(RectF(-kInf, -kInf, kInf, kInf).IsEmpty());
+    for (RectF const& r : {RectF(0, 0, 0, 1), RectF(0, 0, 1, 0), RectF(1, 0, 0, 1), RectF(kNan, 0, 1, 1),
+                           RectF(0, kNan, 1, 1), RectF(0, 0, kNan, 1), RectF(0, 0, 1, kNan)}) {
+        EXPECT_TRUE(r.IsEmpty());
+    }
+}
+
+// Said in terms of points: a line's extent is the one point it lies on, which meets a closed range; two
+// ranges with an extent must share more than a point.
+bool MeetOnAxis(float lowA, float highA, float lowB, float highB) {
+    if (lowA == highA) return lowB <= lowA && lowA <= highB;
+    if (lowB == highB) return lowA <= lowB && lowB <= highA;
+    return lowA < highB && lowB < highA;
+}
+
+TEST(RectFTest, IsIntersectCountsLinesAndNotSharedEdges) {
+    std::vector<float> const edges{-kInf, -1, -0.0f, 0, 0.5f, 1, kInf};
+    std::vector<std::pair<float, float>> extents;
+    for (float const low : edges)
+        for (float const high : edges)
+            if (low <= high) extents.emplace_back(low, high);
+    for (auto const& [lowA, highA] : extents) {
+        for (auto const& [lowB, highB] : extents) {
+            bool const meet = MeetOnAxis(lowA, highA, lowB, highB);
+            // The other axis certainly overlaps, or certainly does not.
+            EXPECT_EQ(RectF(lowA, 0, highA, 2).IsIntersect(RectF(lowB, 1, highB, 3)), meet)
+                << lowA << ' ' << highA << " / " << lowB << ' ' << highB;
+            EXPECT_EQ(RectF(0, lowA, 2, highA).IsIntersect(RectF(1, lowB, 3, highB)), meet);
+            EXPECT_FALSE(RectF(lowA, 0, highA, 1).IsIntersect(RectF(lowB, 2, highB, 3)));
+        }
+    }
+}
+
+TEST(RectFTest, IsIntersectNamedCases) {
+    RectF const frame(0, 0, 100, 50);
+    EXPECT_TRUE(frame.IsIntersect(RectF(10, 50, 20, 50))) << "a horizontal line on the lower edge";
+    EXPECT_TRUE(frame.IsIntersect(RectF(0, 0, 0, 0))) << "a point on the corner";
+    EXPECT_FALSE(frame.IsIntersect(RectF(100, 0, 200, 50))) << "a full rectangle that begins on the edge";
+    EXPECT_FALSE(frame.IsIntersect(RectF(100.5f, 0, 100.5f, 50))) << "a line beyond the edge";
+    for (int edge = 0; edge < 4; ++edge) {
+        float e[4] = {10, 10, 20, 20};
+        e[edge] = kNan;
+        RectF const broken(e[0], e[1], e[2], e[3]);
+        EXPECT_FALSE(frame.IsIntersect(broken)) << edge;
+        EXPECT_FALSE(broken.IsIntersect(frame)) << edge;
+        EXPECT_FALSE(broken.IsIntersect(broken)) << edge;
+    }
+}
+
+} // namespace
+} // namespace Moka
