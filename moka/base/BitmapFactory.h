@@ -1,0 +1,67 @@
+// BitmapFactory: decodes and encodes image files: PNG, JPEG, WebP and this platform's "mki". Reading chooses
+// the codec by content, writing by the path's extension ("png", "jpg", "jpeg", "webp", "mki"; any case). In
+// memory always RGBA8, premultiplied, stride width * 4, in a buffer the bitmap owns. Not looked at: colour
+// profiles, gamma, and the orientation a JPEG file may note: rows come as they are stored. Not read:
+// animations.
+// Thread:  any; no state.
+// Fails:   null or false, and one error line that names the file and the reason. Nothing is left behind: a
+//          decode frees what it had, an encode writes a temporary file beside the target, flushes it and
+//          renames.
+// Limits:  no side above 65,535, no image above 1 GiB decoded, checked before anything is allocated.
+// Cost:    one decoded copy at a time, plus what the codec needs for a row or a block.
+#pragma once
+
+#include "moka/base/Export.h"
+
+#include <cstddef>
+#include <cstdint>
+
+namespace Moka {
+
+class Bitmap;
+class String;
+
+enum class ImageFormat { Unknown, Png, Jpeg, Webp, Mki };
+
+// What a file says about itself before its pixels are decoded.
+struct ImageInfo {
+    ImageFormat format = ImageFormat::Unknown;
+    int width = 0;
+    int height = 0;
+    bool hasAlpha = false;
+    std::uint64_t fileBytes = 0;
+};
+
+class MOKA_API BitmapFactory {
+public:
+    static constexpr int kMaxSide = 65535;
+    static constexpr std::uint64_t kMaxBytes = std::uint64_t{1} << 30;
+
+    // Scaled to exactly width x height (both at least 1): by the codec where it can, by area averaging for
+    // the rest when shrinking and bilinear when growing.
+    static Bitmap* CreateBitmap(String const* path, int width, int height);
+
+    // At the file's own size.
+    static Bitmap* CreateBitmapForGraphics(String const* path);
+
+    // From an encoded file in memory. name appears in messages.
+    static Bitmap* CreateBitmapFromMemory(void const* data, std::size_t size, char const* name);
+
+    // Wraps raw pixels; see Bitmap::Construct. With deleteBuffer the new bitmap owns the buffer. Null when
+    // Construct refuses; the buffer then still belongs to the caller.
+    static Bitmap* CreateBitmapFromBuffer(unsigned char* buffer, int width, int height, int stride,
+                                          int format, bool deleteBuffer);
+
+    // quality is 0 ... 100 (clamped) and means what the codec means by it: JPEG's and WebP's own scale (WebP:
+    // 100 is lossless), ignored by PNG and "mki". JPEG is flattened on white.
+    static bool SaveBitmap(Bitmap const* bitmap, String const* path, int quality);
+
+    // Reads the header only.
+    static bool GetImageInfo(String const* path, ImageInfo* info);
+
+    // Whether SaveBitmap knows the path's extension.
+    static ImageFormat GetFormatByExtension(String const* path);
+    static char const* GetFormatName(ImageFormat format); // "PNG", "JPEG", "WebP", "mki", "unknown"
+};
+
+} // namespace Moka

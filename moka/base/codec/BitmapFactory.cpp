@@ -1,0 +1,229 @@
+#include "moka/base/BitmapFactory.h"
+
+#include "moka/base/Bitmap.h"
+#include "moka/base/String.h"
+#include "moka/base/System.h"
+#include "moka/base/codec/ImageCodec.h"
+#include "moka/base/log/AndroidLog.h"
+
+#include <algorithm>
+#include <new>
+
+namespace Moka {
+namespace {
+
+using detail::ImageCodec;
+using detail::ImageSource;
+using detail::PixelSize;
+
+constexpr ImageCodec const* kCodecs[] = {&detail::kPngCodec, &detail::kJpegCodec, &detail::kWebpCodec,
+                                         &detail::kMkiCodec};
+
+struct Extension {
+    char const* text;
+    ImageFormat format;
+};
+constexpr Extension kExtensions[] = {{"png", ImageFormat::Png},
+                                     {"jpg", ImageFormat::Jpeg},
+                                     {"jpeg", ImageFormat::Jpeg},
+                                     {"webp", ImageFormat::Webp},
+                                     {"mki", ImageFormat::Mki}};
+
+std::string LastComponent(std::string const& path) { return path.substr(path.rfind('/') + 1); }
+
+// A person must see which file it was, but a log may leave the device, and folders tell more than names do.
+std::string Printable(std::string const& path) {
+    std::string name = System::IsBuildTypeEngMode() ? path : LastComponent(path);
+    for (char& c : name) {
+        if (static_cast<unsigned char>(c) < ' ' || c == 0x7F) c = '?';
+    }
+    return name;
+}
+
+void LogFailure(char const* action, std::string const& path, std::string const& reason) {
+    __android_log_print(ANDROID_LOG_ERROR, "mok_log", "cannot %s image '%s': %s", action,
+                        Printable(path).c_str(), reason.c_str());
+}
+
+bool ToPath(String const* text, std::string& path, std::string& reason) {
+    if (text) path = text->ToUtf8();
+    if (path.empty()) {
+        reason = "no path is given";
+    } else if (path.find('\0') != std::string::npos) {
+        reason = "the path has a zero byte in it";
+    }
+    return reason.empty();
+}
+
+ImageCodec const* FindCodec(ImageSource& source, std::string& reason) {
+    detail::ByteSpan head;
+    if (!source.Prefix(detail::kSignatureBytes, head, reason)) return nullptr;
+    for (ImageCodec const* codec : kCodecs) {
+        if (codec->matches(head)) return codec;
+    }
+    reason = head.size == 0 ? "the file is empty" : "it is no PNG, JPEG, WebP or mki file";
+    return nullptr;
+}
+
+Bitmap* Wrap(unsigned char* buffer, PixelSize size, int stride, int format, bool deleteBuffer) {
+    std::unique_ptr<Bitmap> bitmap(new (std::nothrow) Bitmap);
+    if (!bitmap || !bitmap->Construct(buffer, size.width, size.height, stride, format, false, deleteBuffer)) {
+        return nullptr;
+    }
+    return bitmap.release();
+}
+
+Bitmap* Decode(ImageSource& source, PixelSize target, std::string& reason) {
+    detail::PixelBuffer image;
+    ImageCodec const* const codec = FindCodec(source, reason);
+    if (!codec || !codec->decode(source, target, image, reason)) return nullptr;
+    Bitmap* const bitmap = Wrap(image.pixels.get(), image.size, static_cast<int>(image.GetStride()),
+                                Bitmap::kFormatRgba8888, true);
+    if (bitmap) {
+        static_cast<void>(image.pixels.release());
+    } else {
+        reason = "not enough memory";
+    }
+    return bitmap;
+}
+
+Bitmap* DecodeFile(String const* text, PixelSize target) {
+    std::string path;
+    std::string reason;
+    ImageSource source;
+    bool const isOpen = ToPath(text, path, reason) && source.OpenFile(path.c_str(), reason);
+    Bitmap* const bitmap = isOpen ? Decode(source, target, reason) : nullptr;
+    if (!bitmap) LogFailure("read", path, reason);
+    return bitmap;
+}
+
+std::string ExtensionOf(std::string const& path) {
+    std::string const name = LastComponent(path);
+    std::size_t const dot = name.rfind('.');
+    if (dot == std::string::npos) return {};
+    std::string extension = name.substr(dot + 1);
+    // Not tolower, which listens to the process's language.
+    for (char& c : extension) {
+        if (c >= 'A' && c <= 'Z') c = static_cast<char>(c - 'A' + 'a');
+    }
+    return extension;
+}
+
+ImageFormat FormatOf(std::string const& path) {
+    std::string const extension = ExtensionOf(path);
+    for (Extension const& known : kExtensions) {
+        if (extension == known.text) return known.format;
+    }
+    return ImageFormat::Unknown;
+}
+
+bool FindEncoder(std::string const& path, ImageCodec const*& codec, std::string& reason) {
+    ImageFormat const format = FormatOf(path);
+    for (ImageCodec const* candidate : kCodecs) {
+        if (candidate->format == format) codec = candidate;
+    }
+    if (!codec) reason = "unknown extension '" + ExtensionOf(path) + "'; use png, jpg, jpeg, webp or mki";
+    return codec != nullptr;
+}
+
+bool ToView(Bitmap const* bitmap, detail::PixelView& view, std::string& reason) {
+    if (!bitmap || !bitmap->GetBuffer()) {
+        reason = "there are no pixels to save";
+        return false;
+    }
+    view = {bitmap->GetBuffer(),
+            {bitmap->GetWidth(), bitmap->GetHeight()},
+            static_cast<std::size_t>(bitmap->GetStride())};
+    return detail::CheckSize(view.size.width, view.size.height, reason);
+}
+
+bool Save(Bitmap const* bitmap, std::string const& path, int quality, std::string& reason) {
+    detail::PixelView view{};
+    ImageCodec const* codec = nullptr;
+    if (!FindEncoder(path, codec, reason) || !ToView(bitmap, view, reason)) return false;
+    detail::AtomicFile file;
+    bool const isSaved = file.Open(path) && codec->encode(view, quality, file, reason) && file.Commit();
+    // When the file failed, what the codec has to say about it is only a consequence.
+    if (!isSaved && !file.GetReason().empty()) reason = file.GetReason();
+    return isSaved;
+}
+
+} // namespace
+
+Bitmap* BitmapFactory::CreateBitmap(String const* path, int width, int height) {
+    std::string reason;
+    if (detail::CheckSize(width, height, reason)) return DecodeFile(path, {width, height});
+    LogFailure("read", path ? path->ToUtf8() : std::string(), "the size asked for, " + reason);
+    return nullptr;
+}
+
+Bitmap* BitmapFactory::CreateBitmapForGraphics(String const* path) { return DecodeFile(path, {}); }
+
+Bitmap* BitmapFactory::CreateBitmapFromMemory(void const* data, std::size_t size, char const* name) {
+    std::string reason;
+    ImageSource source;
+    source.OpenMemory(data, data ? size : 0);
+    Bitmap* const bitmap = Decode(source, {}, reason);
+    if (!bitmap) LogFailure("read", name ? name : "in memory", reason);
+    return bitmap;
+}
+
+Bitmap* BitmapFactory::CreateBitmapFromBuffer(unsigned char* buffer, int width, int height, int stride,
+                                              int format, bool deleteBuffer) {
+    Bitmap* const bitmap = Wrap(buffer, {width, height}, stride, format, deleteBuffer);
+    if (!bitmap) {
+        LogFailure("wrap", "pixels",
+                   std::to_string(width) + " x " + std::to_string(height) + ", stride " +
+                       std::to_string(stride) + ", format " + std::to_string(format) +
+                       (buffer ? " is not a picture" : " without a buffer"));
+    }
+    return bitmap;
+}
+
+bool BitmapFactory::SaveBitmap(Bitmap const* bitmap, String const* path, int quality) {
+    std::string text;
+    std::string reason;
+    bool const isSaved =
+        ToPath(path, text, reason) && Save(bitmap, text, std::clamp(quality, 0, 100), reason);
+    if (!isSaved) LogFailure("save", text, reason);
+    return isSaved;
+}
+
+bool BitmapFactory::GetImageInfo(String const* path, ImageInfo* info) {
+    std::string text;
+    std::string reason;
+    ImageSource source;
+    ImageInfo found;
+    bool const isOpen = ToPath(path, text, reason) && source.OpenFile(text.c_str(), reason);
+    ImageCodec const* const codec = isOpen ? FindCodec(source, reason) : nullptr;
+    if (!codec || !codec->readInfo(source, found, reason)) {
+        LogFailure("read", text, reason);
+        return false;
+    }
+    found.format = codec->format;
+    found.fileBytes = source.GetSize();
+    if (info) *info = found;
+    return true;
+}
+
+ImageFormat BitmapFactory::GetFormatByExtension(String const* path) {
+    return path ? FormatOf(path->ToUtf8()) : ImageFormat::Unknown;
+}
+
+char const* BitmapFactory::GetFormatName(ImageFormat format) {
+    switch (format) {
+    case ImageFormat::Png:
+        return "PNG";
+    case ImageFormat::Jpeg:
+        return "JPEG";
+    case ImageFormat::Webp:
+        return "WebP";
+    case ImageFormat::Mki:
+        return "mki";
+    case ImageFormat::Unknown:
+        break;
+    }
+    return "unknown";
+}
+
+} // namespace Moka

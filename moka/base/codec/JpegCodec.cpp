@@ -1,0 +1,204 @@
+// JpegCodec.cpp: JPEG through TurboJPEG. Grey, RGB, YCbCr, CMYK and YCCK files become RGB, opaque; an EXIF
+// orientation is not applied, the rows come as the file has them. Saving flattens on white.
+// Damage: a warning of the library means that it guessed pixels, and is a failure, but for the few that real
+//         cameras cause and that leave the pixels right (kHarmless). The library keeps the first warning of
+//         an image only, so the commonest damage, a missing end, is looked for here.
+#include "moka/base/codec/ImageCodec.h"
+#include "moka/base/codec/Premultiply.h"
+
+#include <algorithm>
+#include <cstring>
+#include <turbojpeg.h>
+
+namespace Moka::detail {
+namespace {
+
+// From this quality on colour is kept at full resolution: who asks for it wants thin coloured lines clean.
+constexpr int kFullColourQuality = 90;
+// The header is nearly always within this; profiles and previews can push it further.
+constexpr std::uint64_t kFirstPrefix = 65536;
+
+// Beginnings or inner parts of the library's own texts; it has no codes for them.
+constexpr char const* kHarmless[] = {"extraneous bytes before marker", "unknown JFIF revision number",
+                                     "Unknown Adobe color transform code",
+                                     "Inconsistent progression sequence"};
+
+class Handle : NonAssignable {
+public:
+    explicit Handle(tjhandle handle) : mHandle(handle) {}
+    ~Handle() {
+        if (mHandle) tjDestroy(mHandle);
+    }
+    explicit operator bool() const { return mHandle != nullptr; }
+    tjhandle Get() const { return mHandle; }
+    char const* GetText() const { return tjGetErrorStr2(mHandle); }
+
+    bool IsHarmless(int result) const {
+        if (result == 0) return true;
+        if (tjGetErrorCode(mHandle) != TJERR_WARNING) return false;
+        char const* const text = GetText();
+        return std::any_of(std::begin(kHarmless), std::end(kHarmless),
+                           [text](char const* harmless) { return std::strstr(text, harmless); });
+    }
+
+private:
+    tjhandle mHandle;
+};
+
+bool Refuse(std::string& reason, char const* text) {
+    reason = text;
+    return false;
+}
+
+bool Matches(ByteSpan head) {
+    return head.size >= 3 && head.data[0] == 0xFF && head.data[1] == 0xD8 && head.data[2] == 0xFF;
+}
+
+// What the markers of a file tell that the library does not.
+struct Markers {
+    bool hasEnd = false;
+    bool hasAdobe = false;
+};
+
+// Segments are skipped by their length, so an end marker in an embedded preview is not taken for the image's.
+// In between, and in coded data, a marker is FF and neither stuffing (00, FF) nor a restart (D0 ... D7).
+Markers FindMarkers(ByteSpan file) {
+    Markers markers;
+    for (std::size_t i = 2; i + 1 < file.size;) {
+        void const* const found = std::memchr(file.data + i, 0xFF, file.size - 1 - i);
+        if (!found) break;
+        i = static_cast<std::size_t>(static_cast<unsigned char const*>(found) - file.data);
+        unsigned const code = file.data[i + 1];
+        bool const isMarker = code > 0x01 && code != 0xFF && (code < 0xD0 || code > 0xD8);
+        if (!isMarker) {
+            ++i;
+            continue;
+        }
+        markers.hasEnd = code == 0xD9;
+        if (markers.hasEnd || i + 4 > file.size) break;
+        unsigned char const* const segment = file.data + i + 2;
+        std::size_t const length = segment[0] * 256u + segment[1];
+        bool const holdsName = length >= 14 && i + 9 <= file.size;
+        if (code == 0xEE && holdsName && std::memcmp(segment + 2, "Adobe", 5) == 0) markers.hasAdobe = true;
+        i += 2 + std::max<std::size_t>(length, 2);
+    }
+    return markers;
+}
+
+struct Header {
+    int width = -1;
+    int height = -1;
+    int subsampling = -1;
+    int colourSpace = -1;
+};
+
+// An odd subsampling makes the library call the header bad, but it decodes it; so what counts is whether the
+// size was found.
+bool ReadHeader(Handle const& handle, ByteSpan file, Header& header, std::string& reason) {
+    if (!handle) return Refuse(reason, "not enough memory to decode it");
+    int const result = tjDecompressHeader3(handle.Get(), file.data, file.size, &header.width, &header.height,
+                                           &header.subsampling, &header.colourSpace);
+    if (header.width >= 1 && header.height >= 1) return true;
+    return Refuse(reason, result == 0 ? "it holds tables but no image" : handle.GetText());
+}
+
+bool ReadInfo(ImageSource& source, ImageInfo& info, std::string& reason) {
+    Handle const handle(tjInitDecompress());
+    Header header;
+    for (std::uint64_t count = kFirstPrefix;; count *= 8) {
+        ByteSpan head;
+        if (!source.Prefix(count, head, reason)) return false;
+        if (ReadHeader(handle, head, header, reason)) break;
+        if (count >= source.GetSize()) return false;
+    }
+    info.width = header.width;
+    info.height = header.height;
+    info.hasAlpha = false;
+    return CheckSize(header.width, header.height, reason);
+}
+
+// The smallest the decoder itself can make that is not smaller than wanted on an axis that shrinks.
+PixelSize ChooseDecodedSize(PixelSize own, PixelSize wanted) {
+    int count = 0;
+    tjscalingfactor const* const factors = tjGetScalingFactors(&count);
+    PixelSize best = own;
+    for (int i = 0; i < count; ++i) {
+        tjscalingfactor const factor = factors[i];
+        PixelSize const size{TJSCALED(own.width, factor), TJSCALED(own.height, factor)};
+        bool const isEnough = size.width >= std::min(wanted.width, own.width) &&
+                              size.height >= std::min(wanted.height, own.height);
+        if (isEnough && size.width <= best.width && size.height <= best.height) best = size;
+    }
+    return best;
+}
+
+// Files with Adobe's marker hold CMYK inverted, which makes them products of light; without it, of ink.
+void ConvertCmyk(PixelBuffer const& image, bool isInverted) {
+    unsigned const flip = isInverted ? 0 : 255;
+    unsigned char* pixel = image.pixels.get();
+    for (unsigned char* const end = pixel + image.GetCount() * 4; pixel != end; pixel += 4) {
+        unsigned const light = pixel[3] ^ flip;
+        for (int i = 0; i < 3; ++i)
+            pixel[i] = static_cast<unsigned char>(((pixel[i] ^ flip) * light + 127) / 255);
+        pixel[3] = 255;
+    }
+}
+
+bool Decode(ImageSource& source, PixelSize target, PixelBuffer& image, std::string& reason) {
+    ByteSpan file;
+    if (!source.Prefix(source.GetSize(), file, reason)) return false;
+    Handle const handle(tjInitDecompress());
+    Header header;
+    if (!ReadHeader(handle, file, header, reason)) return false;
+    PixelSize const own{header.width, header.height};
+    if (!CheckSize(own.width, own.height, reason)) return false;
+    Markers const markers = FindMarkers(file);
+    if (!markers.hasEnd) return Refuse(reason, "the file is truncated");
+
+    PixelSize const wanted = ChooseSize(target, own);
+    if (!image.Allocate(ChooseDecodedSize(own, wanted), reason)) return false;
+    bool const isCmyk = header.colourSpace == TJCS_CMYK || header.colourSpace == TJCS_YCCK;
+    int const result = tjDecompress2(handle.Get(), file.data, file.size, image.pixels.get(), image.size.width,
+                                     static_cast<int>(image.GetStride()), image.size.height,
+                                     isCmyk ? TJPF_CMYK : TJPF_RGBA, TJFLAG_ACCURATEDCT | TJFLAG_LIMITSCANS);
+    if (!handle.IsHarmless(result)) return Refuse(reason, handle.GetText());
+    if (isCmyk) ConvertCmyk(image, markers.hasAdobe);
+    return ScaleImage(image, wanted, reason);
+}
+
+struct TurboDeleter {
+    void operator()(unsigned char* memory) const { tjFree(memory); }
+};
+
+bool Compress(unsigned char const* pixels, PixelSize size, std::size_t stride, int format, int quality,
+              AtomicFile& file, std::string& reason) {
+    Handle const handle(tjInitCompress());
+    if (!handle) return Refuse(reason, "not enough memory to encode it");
+    unsigned char* encoded = nullptr;
+    unsigned long count = 0;
+    int const result = tjCompress2(
+        handle.Get(), pixels, size.width, static_cast<int>(stride), size.height, format, &encoded, &count,
+        quality >= kFullColourQuality ? TJSAMP_444 : TJSAMP_420, quality, TJFLAG_ACCURATEDCT);
+    std::unique_ptr<unsigned char, TurboDeleter> const owner(encoded);
+    if (result != 0) return Refuse(reason, handle.GetText());
+    return file.Write(encoded, count);
+}
+
+bool Encode(PixelView const& view, int quality, AtomicFile& file, std::string& reason) {
+    if (view.IsOpaque())
+        return Compress(view.pixels, view.size, view.stride, TJPF_RGBX, quality, file, reason);
+    std::size_t const stride = view.GetWidth() * 3;
+    std::unique_ptr<unsigned char[]> const flat(
+        new (std::nothrow) unsigned char[stride * static_cast<std::size_t>(view.size.height)]);
+    if (!flat) return Refuse(reason, "not enough memory to lay it over white");
+    for (int y = 0; y < view.size.height; ++y) {
+        FlattenOnWhite(view.Row(y), flat.get() + stride * static_cast<std::size_t>(y), view.GetWidth());
+    }
+    return Compress(flat.get(), view.size, stride, TJPF_RGB, quality, file, reason);
+}
+
+} // namespace
+
+extern ImageCodec const kJpegCodec{ImageFormat::Jpeg, Matches, ReadInfo, Decode, Encode};
+
+} // namespace Moka::detail

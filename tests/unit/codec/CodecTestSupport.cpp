@@ -1,0 +1,222 @@
+#include "tests/unit/codec/CodecTestSupport.h"
+
+#include "moka/base/Bitmap.h"
+#include "moka/base/String.h"
+#include "moka/base/log/AndroidLog.h"
+
+#include <algorithm>
+#include <atomic>
+#include <cmath>
+#include <cstdlib>
+#include <filesystem>
+#include <fstream>
+#include <gtest/gtest.h>
+#include <iterator>
+#include <memory>
+#include <new>
+#include <random>
+
+namespace {
+
+std::atomic<std::size_t> liveBytes{0};
+std::atomic<std::size_t> peakBytes{0};
+constexpr std::size_t kPrefix = 16; // keeps the alignment
+
+void* AllocateCounted(std::size_t size) {
+    auto* const block = static_cast<unsigned char*>(std::malloc(size + kPrefix));
+    if (!block) return nullptr;
+    *reinterpret_cast<std::size_t*>(block) = size;
+    std::size_t const live = liveBytes += size;
+    std::size_t peak = peakBytes;
+    while (live > peak && !peakBytes.compare_exchange_weak(peak, live)) {
+    }
+    return block + kPrefix;
+}
+
+void FreeCounted(void* memory) {
+    if (!memory) return;
+    auto* const block = static_cast<unsigned char*>(memory) - kPrefix;
+    liveBytes -= *reinterpret_cast<std::size_t*>(block);
+    std::free(block);
+}
+
+} // namespace
+
+void* operator new[](std::size_t size) {
+    void* const memory = AllocateCounted(size);
+    if (!memory) throw std::bad_alloc();
+    return memory;
+}
+void* operator new[](std::size_t size, std::nothrow_t const&) noexcept { return AllocateCounted(size); }
+void operator delete[](void* memory) noexcept { FreeCounted(memory); }
+void operator delete[](void* memory, std::size_t) noexcept { FreeCounted(memory); }
+void operator delete[](void* memory, std::nothrow_t const&) noexcept { FreeCounted(memory); }
+
+namespace Moka::test {
+namespace {
+
+Image MakeImage(int width, int height) {
+    return {width, height, Bytes(static_cast<std::size_t>(width) * static_cast<std::size_t>(height) * 4)};
+}
+
+Image FromBitmap(Bitmap* bitmap) {
+    std::unique_ptr<Bitmap> const owner(bitmap);
+    if (!bitmap) return {};
+    EXPECT_EQ(bitmap->GetStride(), bitmap->GetWidth() * 4);
+    EXPECT_TRUE(bitmap->GetDeleteBuffer());
+    Image image = MakeImage(bitmap->GetWidth(), bitmap->GetHeight());
+    std::copy_n(bitmap->GetBuffer(), image.pixels.size(), image.pixels.begin());
+    return image;
+}
+
+} // namespace
+
+Image MakeTranslucentNoise(int width, int height, unsigned seed) {
+    std::mt19937 random(seed);
+    Image image = MakeImage(width, height);
+    for (std::size_t i = 0; i < image.pixels.size(); i += 4) {
+        unsigned const alpha = random() % 256;
+        for (std::size_t c = 0; c < 3; ++c)
+            image.pixels[i + c] = static_cast<unsigned char>(random() % (alpha + 1));
+        image.pixels[i + 3] = static_cast<unsigned char>(alpha);
+    }
+    return image;
+}
+
+Image MakeOpaqueNoise(int width, int height, unsigned seed) {
+    std::mt19937 random(seed);
+    Image image = MakeImage(width, height);
+    for (unsigned char& byte : image.pixels) byte = static_cast<unsigned char>(random());
+    for (std::size_t i = 3; i < image.pixels.size(); i += 4) image.pixels[i] = 255;
+    return image;
+}
+
+Image MakeGradient(int width, int height, bool isOpaque) {
+    Image image = MakeImage(width, height);
+    std::size_t i = 0;
+    for (int y = 0; y < height; ++y) {
+        for (int x = 0; x < width; ++x) {
+            double const u = (x + 0.5) / width;
+            double const v = (y + 0.5) / height;
+            double const alpha = isOpaque ? 1 : 0.5 + 0.5 * std::sin(3 * u + 2 * v);
+            double const colours[4] = {u, v, 0.5 + 0.5 * std::sin(4 * (u + v)), 1};
+            for (double colour : colours)
+                image.pixels[i++] = static_cast<unsigned char>(255 * colour * alpha);
+        }
+    }
+    return image;
+}
+
+Image FlattenOnWhite(Image image) {
+    for (std::size_t i = 0; i < image.pixels.size(); i += 4) {
+        int const white = 255 - image.pixels[i + 3];
+        for (std::size_t c = 0; c < 4; ++c)
+            image.pixels[i + c] = static_cast<unsigned char>(image.pixels[i + c] + white);
+    }
+    return image;
+}
+
+int LargestDifference(Image const& a, Image const& b) {
+    if (a.width != b.width || a.height != b.height || a.pixels.empty()) return 256;
+    int largest = 0;
+    for (std::size_t i = 0; i < a.pixels.size(); ++i) {
+        largest = std::max(largest, std::abs(a.pixels[i] - b.pixels[i]));
+    }
+    return largest;
+}
+
+TempFolder::TempFolder() {
+    std::string pattern = (std::filesystem::temp_directory_path() / "moka-codec-XXXXXX").string();
+    mPath = mkdtemp(pattern.data());
+}
+
+TempFolder::~TempFolder() { std::filesystem::remove_all(mPath); }
+
+std::vector<std::string> TempFolder::List() const {
+    std::vector<std::string> names;
+    for (auto const& entry : std::filesystem::directory_iterator(mPath)) {
+        names.push_back(entry.path().filename().string());
+    }
+    std::sort(names.begin(), names.end());
+    return names;
+}
+
+void WriteFile(std::string const& path, Bytes const& bytes) {
+    std::ofstream file(path, std::ios::binary);
+    file.write(reinterpret_cast<char const*>(bytes.data()), static_cast<std::streamsize>(bytes.size()));
+    ASSERT_TRUE(file.good()) << path;
+}
+
+Bytes ReadFile(std::string const& path) {
+    std::ifstream file(path, std::ios::binary);
+    return Bytes(std::istreambuf_iterator<char>(file), {});
+}
+
+ErrorLines::ErrorLines()
+    : mBefore(SetLogSink([this](LogLine const& line) {
+          EXPECT_EQ(line.priority, ANDROID_LOG_ERROR) << line.text;
+          EXPECT_EQ(line.tag, "mok_log") << line.text;
+          mLines.push_back(line.text);
+      })) {}
+
+ErrorLines::~ErrorLines() {
+    SetLogSink(mBefore);
+    EXPECT_TRUE(mLines.empty()) << "unexpected: " << mLines.front();
+}
+
+std::vector<std::string> ErrorLines::Take() {
+    std::vector<std::string> lines;
+    lines.swap(mLines);
+    return lines;
+}
+
+std::size_t ArrayMemory::GetLive() { return liveBytes; }
+std::size_t ArrayMemory::GetPeak() { return peakBytes; }
+void ArrayMemory::ResetPeak() { peakBytes = liveBytes.load(); }
+
+Image Decode(Bytes const& file, char const* name) {
+    return FromBitmap(BitmapFactory::CreateBitmapFromMemory(file.data(), file.size(), name));
+}
+
+Image DecodeFile(std::string const& path) {
+    String const text(path);
+    return FromBitmap(BitmapFactory::CreateBitmapForGraphics(&text));
+}
+
+Image DecodeScaled(std::string const& path, int width, int height) {
+    String const text(path);
+    return FromBitmap(BitmapFactory::CreateBitmap(&text, width, height));
+}
+
+bool Save(Image const& image, std::string const& path, int quality) {
+    Bitmap bitmap;
+    Bytes pixels = image.pixels;
+    EXPECT_TRUE(bitmap.Construct(pixels.data(), image.width, image.height, image.width * 4, 1, false, false));
+    String const text(path);
+    return BitmapFactory::SaveBitmap(&bitmap, &text, quality);
+}
+
+Bytes Encode(Image const& image, std::string const& extension, int quality) {
+    TempFolder const folder;
+    std::string const path = folder.Path("image." + extension);
+    EXPECT_TRUE(Save(image, path, quality));
+    return ReadFile(path);
+}
+
+Bytes Replace(Bytes bytes, std::size_t at, Bytes const& with) {
+    std::copy(with.begin(), with.end(), bytes.begin() + static_cast<std::ptrdiff_t>(at));
+    return bytes;
+}
+
+Bytes Insert(Bytes bytes, std::size_t at, Bytes const& what) {
+    bytes.insert(bytes.begin() + static_cast<std::ptrdiff_t>(at), what.begin(), what.end());
+    return bytes;
+}
+
+std::size_t Find(Bytes const& bytes, Bytes const& what) {
+    auto const found = std::search(bytes.begin(), bytes.end(), what.begin(), what.end());
+    EXPECT_NE(found, bytes.end());
+    return static_cast<std::size_t>(found - bytes.begin());
+}
+
+} // namespace Moka::test

@@ -1,0 +1,95 @@
+// CodecTestSupport.h: pictures, temporary folders, captured log lines and counted pixel memory for the tests
+// of the image codecs.
+#pragma once
+
+#include "moka/base/BitmapFactory.h"
+#include "moka/base/log/LogSink.h"
+
+#include <cstdint>
+#include <string>
+#include <vector>
+
+namespace Moka::test {
+
+using Bytes = std::vector<unsigned char>;
+
+struct Image {
+    int width = 0;
+    int height = 0;
+    Bytes pixels; // RGBA8, premultiplied; empty when there is no image
+
+    unsigned char const* At(int x, int y) const {
+        return &pixels[(static_cast<std::size_t>(y) * static_cast<std::size_t>(width) +
+                        static_cast<std::size_t>(x)) *
+                       4];
+    }
+    friend bool operator==(Image const& a, Image const& b) {
+        return a.width == b.width && a.height == b.height && a.pixels == b.pixels;
+    }
+};
+
+// Every alpha occurs, and colours from 0 up to it.
+Image MakeTranslucentNoise(int width, int height, unsigned seed = 1);
+Image MakeOpaqueNoise(int width, int height, unsigned seed = 1);
+// Smooth, so that lossy codecs come close.
+Image MakeGradient(int width, int height, bool isOpaque);
+Image FlattenOnWhite(Image image);
+
+// The greatest difference of any byte; 256 when the sizes differ.
+int LargestDifference(Image const& a, Image const& b);
+
+// A folder that goes, with its files, at the end of the test.
+class TempFolder {
+public:
+    TempFolder();
+    ~TempFolder();
+    TempFolder(TempFolder const&) = delete;
+    TempFolder& operator=(TempFolder const&) = delete;
+
+    std::string Path(std::string const& name) const { return mPath + "/" + name; }
+    std::vector<std::string> List() const; // sorted
+
+private:
+    std::string mPath;
+};
+
+void WriteFile(std::string const& path, Bytes const& bytes);
+Bytes ReadFile(std::string const& path);
+
+// Error lines while it lives. Everything else fails the test: codecs have nothing else to say.
+class ErrorLines {
+public:
+    ErrorLines();
+    ~ErrorLines();
+    ErrorLines(ErrorLines const&) = delete;
+    ErrorLines& operator=(ErrorLines const&) = delete;
+
+    std::vector<std::string> Take();
+
+private:
+    std::vector<std::string> mLines;
+    LogSink mBefore;
+};
+
+// Bytes allocated by array new and not deleted, in the whole process: the pixel buffers and little else.
+class ArrayMemory {
+public:
+    static std::size_t GetLive();
+    static std::size_t GetPeak();
+    static void ResetPeak(); // to what is live
+};
+
+// Empty images when the factory returns null.
+Image Decode(Bytes const& file, char const* name = "test");
+Image DecodeFile(std::string const& path);
+Image DecodeScaled(std::string const& path, int width, int height);
+bool Save(Image const& image, std::string const& path, int quality);
+// Through a file; fails the test when it cannot be saved.
+Bytes Encode(Image const& image, std::string const& extension, int quality = 100);
+
+// Edits in a copy.
+Bytes Replace(Bytes bytes, std::size_t at, Bytes const& with);
+Bytes Insert(Bytes bytes, std::size_t at, Bytes const& what);
+std::size_t Find(Bytes const& bytes, Bytes const& what); // fails the test when it is not there
+
+} // namespace Moka::test

@@ -1,0 +1,203 @@
+#include "moka/base/String.h"
+#include "moka/base/System.h"
+#include "tests/unit/codec/CodecTestSupport.h"
+
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+#include <sys/stat.h>
+#include <unistd.h>
+#include <utility>
+#include <zlib.h>
+
+namespace Moka::test {
+namespace {
+
+using ::testing::AllOf;
+using ::testing::ElementsAre;
+using ::testing::HasSubstr;
+using ::testing::Not;
+
+struct Kind {
+    char const* extension;
+    int quality;
+};
+constexpr Kind kKinds[] = {{"png", 100}, {"jpg", 80}, {"webp", 100}, {"webp", 60}, {"mki", 100}};
+
+class Malformed : public ::testing::Test {
+protected:
+    void SetUp() override { ::testing::internal::CaptureStderr(); }
+    void TearDown() override {
+        EXPECT_EQ(::testing::internal::GetCapturedStderr(), "") << "a library wrote to stderr";
+    }
+
+    // Either the file is refused with one line that names it, or it is an image and nothing is said.
+    bool Refuses(Bytes const& file) {
+        std::size_t const live = ArrayMemory::GetLive();
+        bool const isNull = Decode(file, "some/folder/broken.img").pixels.empty();
+        EXPECT_EQ(ArrayMemory::GetLive(), live) << "memory was kept";
+        std::vector<std::string> const lines = errors.Take();
+        EXPECT_EQ(lines.size(), isNull ? 1u : 0u) << ::testing::PrintToString(lines);
+        for (std::string const& line : lines)
+            EXPECT_THAT(line, AllOf(HasSubstr("'broken.img'"), Not(HasSubstr("folder"))));
+        return isNull;
+    }
+
+    ErrorLines errors;
+};
+
+TEST_F(Malformed, EveryTruncationIsRefused) {
+    for (Kind const& kind : kKinds) {
+        for (Image const& image : {MakeTranslucentNoise(7, 5), MakeOpaqueNoise(16, 16)}) {
+            Bytes const file = Encode(image, kind.extension, kind.quality);
+            ASSERT_FALSE(Refuses(file));
+            for (std::size_t size = 0; size < file.size(); ++size) {
+                ASSERT_TRUE(Refuses(Bytes(file.begin(), file.begin() + static_cast<std::ptrdiff_t>(size))))
+                    << kind.extension << ": " << size << " of " << file.size();
+            }
+        }
+    }
+}
+
+TEST_F(Malformed, EveryChangedByteOfACheckedHeaderIsRefused) {
+    for (auto const& [extension, headerBytes] : {std::pair{"png", 33u}, std::pair{"mki", 32u}}) {
+        Bytes const file = Encode(MakeTranslucentNoise(7, 5), extension);
+        for (std::size_t i = 0; i < headerBytes; ++i) {
+            for (unsigned flip = 1; flip < 256; ++flip) {
+                Bytes changed = file;
+                changed[i] = static_cast<unsigned char>(changed[i] ^ flip);
+                ASSERT_TRUE(Refuses(changed)) << extension << " byte " << i << " xor " << flip;
+            }
+        }
+    }
+}
+
+TEST_F(Malformed, EveryChangedByteIsRefusedOrHarmless) {
+    Image const image = MakeTranslucentNoise(7, 5);
+    for (Kind const& kind : kKinds) {
+        Bytes const file = Encode(image, kind.extension, kind.quality);
+        bool const isChecked = std::string(kind.extension) == "png" || std::string(kind.extension) == "mki";
+        for (std::size_t i = 0; i < file.size(); ++i) {
+            for (unsigned flip : {0x01u, 0x10u, 0x80u, 0xFFu}) {
+                Bytes changed = file;
+                changed[i] = static_cast<unsigned char>(changed[i] ^ flip);
+                bool const isRefused = Refuses(changed);
+                // Formats with checksums never show wrong pixels.
+                if (isChecked && !isRefused) {
+                    EXPECT_EQ(Decode(changed), image) << kind.extension << " byte " << i;
+                }
+            }
+        }
+    }
+}
+
+Bytes MakePngHeader(std::uint32_t width, std::uint32_t height) {
+    Bytes file = Encode(MakeOpaqueNoise(4, 4), "png");
+    for (int i = 0; i < 4; ++i) {
+        file[static_cast<std::size_t>(16 + i)] = static_cast<unsigned char>(width >> (24 - 8 * i));
+        file[static_cast<std::size_t>(20 + i)] = static_cast<unsigned char>(height >> (24 - 8 * i));
+    }
+    std::uint32_t const check = static_cast<std::uint32_t>(crc32(0, &file[12], 17));
+    for (int i = 0; i < 4; ++i)
+        file[static_cast<std::size_t>(29 + i)] = static_cast<unsigned char>(check >> (24 - 8 * i));
+    return file;
+}
+
+TEST_F(Malformed, HugeClaimsAreRefusedBeforeAnythingIsAllocated) {
+    Bytes const jpeg = Encode(MakeOpaqueNoise(8, 8), "jpg", 80);
+    std::size_t const frame = Find(jpeg, {0xFF, 0xC0});
+    // A still image of 16,777,216 x 1 in the extended header.
+    Bytes const webp = {'R', 'I', 'F', 'F', 22, 0, 0, 0, 'W', 'E', 'B', 'P', 'V', 'P', '8',
+                        'X', 10,  0,   0,   0,  0, 0, 0, 0,   255, 255, 255, 0,   0,   0};
+    struct {
+        Bytes file;
+        char const* reason;
+    } const cases[] = {
+        {MakePngHeader(65536, 1), "above 65535"},
+        {MakePngHeader(1, 65536), "above 65535"},
+        {MakePngHeader(0x7FFFFFFF, 0x7FFFFFFF), "above 65535"},
+        {MakePngHeader(65535, 65535), "1 GiB"},
+        {MakePngHeader(16385, 16384), "1 GiB"},
+        {MakePngHeader(0xFFFFFFFF, 1), "out of range"},
+        {MakePngHeader(0, 5), "IHDR"},
+        {Replace(jpeg, frame + 5, {0xFF, 0xFF, 0xFF, 0xFF}), "65500"},
+        {Replace(jpeg, frame + 5, {0xFF, 0x00, 0xFF, 0x00}), "1 GiB"},
+        {Replace(jpeg, frame + 5, {0, 0, 0, 8}), "'huge'"},
+        {webp, "above 65535"},
+    };
+    for (auto const& one : cases) {
+        ArrayMemory::ResetPeak();
+        std::size_t const before = ArrayMemory::GetPeak();
+        EXPECT_TRUE(Decode(one.file, "huge").pixels.empty()) << one.reason;
+        EXPECT_LT(ArrayMemory::GetPeak() - before, 100000u) << one.reason;
+        EXPECT_THAT(errors.Take(), ElementsAre(HasSubstr(one.reason)));
+    }
+    // Within the limits, but there is nothing behind it.
+    EXPECT_TRUE(Refuses(MakePngHeader(16384, 16384)));
+    EXPECT_TRUE(Refuses(Replace(jpeg, frame + 5, {0x20, 0x00, 0x20, 0x00})));
+}
+
+TEST_F(Malformed, AnimationsAreRefusedByName) {
+    Bytes const animated = {'R', 'I', 'F', 'F', 22, 0,    0, 0, 'W', 'E', 'B', 'P', 'V', 'P', '8',
+                            'X', 10,  0,   0,   0,  0x02, 0, 0, 0,   9,   0,   0,   9,   0,   0};
+    EXPECT_TRUE(Decode(animated, "cat.webp").pixels.empty());
+    EXPECT_THAT(errors.Take(), ElementsAre(AllOf(HasSubstr("cat.webp"), HasSubstr("animated"))));
+}
+
+TEST_F(Malformed, WhatIsNoImageFileIsRefusedByEveryReader) {
+    TempFolder const folder;
+    WriteFile(folder.Path("empty.png"), {});
+    WriteFile(folder.Path("text.png"), {'h', 'e', 'l', 'l', 'o'});
+    ASSERT_EQ(mkfifo(folder.Path("pipe.png").c_str(), 0600), 0);
+    std::string const withZero = folder.Path("empty.png") + std::string("\0.png", 5);
+    struct {
+        std::string path;
+        char const* reason;
+    } const cases[] = {
+        {folder.Path("empty.png"), "'empty.png': the file is empty"},
+        {folder.Path("text.png"), "'text.png': it is no"},
+        {folder.Path("missing.png"), "'missing.png': No such file"},
+        {folder.Path(""), "folder"},
+        {folder.Path("pipe.png"), "'pipe.png': it is not a regular file"},
+        {"/dev/zero", "'zero': it is not a regular file"},
+        {folder.Path("text.png/below.png"), "Not a directory"},
+        {withZero, "zero byte"},
+        {"", "no path"},
+    };
+    for (auto const& one : cases) {
+        String const text(one.path);
+        EXPECT_EQ(BitmapFactory::CreateBitmapForGraphics(&text), nullptr);
+        EXPECT_THAT(errors.Take(), ElementsAre(HasSubstr(one.reason)));
+        EXPECT_EQ(BitmapFactory::CreateBitmap(&text, 4, 4), nullptr);
+        EXPECT_THAT(errors.Take(), ElementsAre(HasSubstr(one.reason)));
+        ImageInfo info;
+        EXPECT_FALSE(BitmapFactory::GetImageInfo(&text, &info));
+        EXPECT_THAT(errors.Take(), ElementsAre(HasSubstr(one.reason)));
+        EXPECT_EQ(info.format, ImageFormat::Unknown);
+    }
+    EXPECT_EQ(BitmapFactory::CreateBitmapForGraphics(nullptr), nullptr);
+    EXPECT_EQ(BitmapFactory::CreateBitmapFromMemory(nullptr, 10, nullptr), nullptr);
+    EXPECT_EQ(errors.Take().size(), 2u);
+}
+
+TEST_F(Malformed, AFileTooLargeForAnyImageIsNotRead) {
+    TempFolder const folder;
+    std::string const path = folder.Path("large.png");
+    WriteFile(path, Encode(MakeOpaqueNoise(4, 4), "png"));
+    ASSERT_EQ(truncate(path.c_str(), off_t{1} << 31), 0); // sparse
+    EXPECT_TRUE(DecodeFile(path).pixels.empty());
+    EXPECT_THAT(errors.Take(), ElementsAre(HasSubstr("2147483648 bytes")));
+}
+
+TEST_F(Malformed, FoldersAreNamedInEngineeringBuildsOnly) {
+    String const text("/no-such-folder/in\nside.png");
+    for (bool const isEngineering : {false, true}) {
+        System::SetBuildTypeEngMode(isEngineering);
+        EXPECT_EQ(BitmapFactory::CreateBitmapForGraphics(&text), nullptr);
+        System::SetBuildTypeEngMode(false);
+        EXPECT_THAT(errors.Take(), ElementsAre(HasSubstr(isEngineering ? "'/no-such-folder/in?side.png'"
+                                                                       : "'in?side.png'")));
+    }
+}
+
+} // namespace
+} // namespace Moka::test

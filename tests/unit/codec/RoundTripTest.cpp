@@ -1,0 +1,145 @@
+#include "moka/base/Bitmap.h"
+#include "moka/base/String.h"
+#include "tests/unit/codec/CodecTestSupport.h"
+
+#include <algorithm>
+#include <gtest/gtest.h>
+
+namespace Moka::test {
+namespace {
+
+TEST(RoundTrip, LosslessFormatsKeepEveryPremultipliedPixel) {
+    // Every valid pair of colour and alpha, and shapes that leave odd rows.
+    Image everyPair{256, 256, {}};
+    for (int a = 0; a < 256; ++a) {
+        for (int c = 0; c < 256; ++c) {
+            auto const colour = static_cast<unsigned char>(std::min(a, c));
+            everyPair.pixels.insert(everyPair.pixels.end(),
+                                    {colour, 0, colour, static_cast<unsigned char>(a)});
+        }
+    }
+    Image const images[] = {everyPair,
+                            MakeTranslucentNoise(1, 1),
+                            MakeTranslucentNoise(1, 97),
+                            MakeTranslucentNoise(301, 1),
+                            MakeOpaqueNoise(67, 45),
+                            MakeGradient(640, 480, false)};
+    for (Image const& image : images) {
+        for (char const* extension : {"png", "webp", "mki"}) {
+            EXPECT_EQ(Decode(Encode(image, extension)), image)
+                << extension << ' ' << image.width << " x " << image.height;
+        }
+    }
+}
+
+TEST(RoundTrip, LossyFormatsComeClose) {
+    for (bool const isOpaque : {true, false}) {
+        Image const image = MakeGradient(200, 120, isOpaque);
+        EXPECT_LE(LargestDifference(Decode(Encode(image, "jpg", 95)), FlattenOnWhite(image)), 6);
+        EXPECT_LE(LargestDifference(Decode(Encode(image, "webp", 95)), image), 12);
+    }
+    // Fine structure shows that quality does something, in either codec.
+    Image const noise = MakeOpaqueNoise(64, 64);
+    for (char const* extension : {"jpg", "webp"}) {
+        EXPECT_LT(Encode(noise, extension, 10).size() * 2, Encode(noise, extension, 95).size()) << extension;
+        EXPECT_EQ(Encode(noise, extension, -5), Encode(noise, extension, 0)) << extension;
+        EXPECT_EQ(Encode(noise, extension, 1000), Encode(noise, extension, 100)) << extension;
+    }
+}
+
+TEST(RoundTrip, HonoursAStrideWiderThanTheRow) {
+    Image const image = MakeTranslucentNoise(37, 11);
+    constexpr int kStride = 37 * 4 + 20;
+    Bytes padded(static_cast<std::size_t>(kStride * 11), 0xEE);
+    for (int y = 0; y < 11; ++y) std::copy_n(image.At(0, y), 37 * 4, padded.begin() + y * kStride);
+    Bitmap bitmap;
+    ASSERT_TRUE(bitmap.Construct(padded.data(), 37, 11, kStride, 1, false, false));
+    TempFolder const folder;
+    for (char const* extension : {"png", "webp", "mki", "jpg"}) {
+        std::string const path = folder.Path(std::string("padded.") + extension);
+        String const text(path);
+        ASSERT_TRUE(BitmapFactory::SaveBitmap(&bitmap, &text, 100));
+        EXPECT_EQ(ReadFile(path), Encode(image, extension)) << extension;
+    }
+}
+
+TEST(RoundTrip, InfoTellsTheHeaderWithoutThePixels) {
+    TempFolder const folder;
+    for (bool const isOpaque : {true, false}) {
+        Image const image = MakeGradient(300, 200, isOpaque);
+        for (char const* extension : {"png", "webp", "mki", "jpg"}) {
+            std::string const path = folder.Path(std::string("image.") + extension);
+            ASSERT_TRUE(Save(image, path, 100));
+            Bytes bytes = ReadFile(path);
+            std::string const kind = extension;
+            // "mki" states the payload's length in its header, so there a short file is known at once.
+            if (kind != "mki") bytes.resize(bytes.size() / 2);
+            WriteFile(path, bytes);
+            String const text(path);
+            ImageInfo info;
+            ASSERT_TRUE(BitmapFactory::GetImageInfo(&text, &info)) << extension;
+            EXPECT_EQ(info.format, BitmapFactory::GetFormatByExtension(&text));
+            EXPECT_EQ(info.width, 300);
+            EXPECT_EQ(info.height, 200);
+            EXPECT_EQ(info.hasAlpha, kind == "mki" || (kind != "jpg" && !isOpaque)) << extension;
+            EXPECT_EQ(info.fileBytes, bytes.size());
+        }
+    }
+}
+
+TEST(RoundTrip, ContentDecidesWhenReadingAndTheExtensionWhenWriting) {
+    TempFolder const folder;
+    Image const image = MakeOpaqueNoise(9, 9);
+    struct {
+        char const* name;
+        ImageFormat format;
+    } const cases[] = {{"a.PnG", ImageFormat::Png},
+                       {"a.JPG", ImageFormat::Jpeg},
+                       {"b.jpeg", ImageFormat::Jpeg},
+                       {"c.d.WebP", ImageFormat::Webp},
+                       {"e.MKI", ImageFormat::Mki}};
+    for (auto const& one : cases) {
+        String const text(folder.Path(one.name));
+        EXPECT_EQ(BitmapFactory::GetFormatByExtension(&text), one.format) << one.name;
+        ASSERT_TRUE(Save(image, folder.Path(one.name), 100));
+        WriteFile(folder.Path("misnamed.png"), ReadFile(folder.Path(one.name)));
+        String const misnamed(folder.Path("misnamed.png"));
+        ImageInfo info;
+        ASSERT_TRUE(BitmapFactory::GetImageInfo(&misnamed, &info));
+        EXPECT_EQ(info.format, one.format) << one.name;
+        EXPECT_FALSE(DecodeFile(folder.Path("misnamed.png")).pixels.empty());
+    }
+    for (char const* name : {"x.gif", "png", "x.", "x.png/y", "x.pngx", ""}) {
+        String const text(name);
+        EXPECT_EQ(BitmapFactory::GetFormatByExtension(&text), ImageFormat::Unknown) << name;
+    }
+}
+
+TEST(RoundTrip, DecodingHoldsOneCopyOfThePixels) {
+    TempFolder const folder;
+    constexpr std::size_t kSide = 768;
+    constexpr std::size_t kFull = kSide * kSide * 4;
+    constexpr std::size_t kSlack = 128 * 1024;              // a block of the file, rows, weights
+    Image const image = MakeTranslucentNoise(kSide, kSide); // hardly compresses
+    for (char const* extension : {"png", "webp", "mki", "jpg"}) {
+        std::string const path = folder.Path(std::string("image.") + extension);
+        ASSERT_TRUE(Save(image, path, 100));
+        String const text(path);
+        std::size_t const before = ArrayMemory::GetLive();
+        auto const peakOf = [&](int side) {
+            ArrayMemory::ResetPeak();
+            delete BitmapFactory::CreateBitmap(&text, side, side);
+            EXPECT_EQ(ArrayMemory::GetLive(), before) << extension;
+            return ArrayMemory::GetPeak() - before;
+        };
+        EXPECT_GE(peakOf(kSide), kFull) << extension;
+        EXPECT_LE(peakOf(kSide), kFull + kSlack) << extension;
+        // Scaled, only the result is held; JPEG decodes to the next eighth and shrinks that within its
+        // memory.
+        EXPECT_LE(peakOf(kSide / 8), kFull / 64 + kSlack) << extension;
+        EXPECT_LE(peakOf(kSide * 5 / 8 - 3), kFull * 25 / 64 + kSlack) << extension;
+    }
+}
+
+} // namespace
+} // namespace Moka::test

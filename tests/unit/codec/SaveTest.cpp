@@ -1,0 +1,186 @@
+#include "moka/base/Bitmap.h"
+#include "moka/base/String.h"
+#include "tests/unit/codec/CodecTestSupport.h"
+
+#include <csignal>
+#include <cstring>
+#include <fcntl.h>
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+#include <sys/resource.h>
+#include <sys/stat.h>
+#include <unistd.h>
+
+namespace Moka::test {
+namespace {
+
+using ::testing::AllOf;
+using ::testing::ElementsAre;
+using ::testing::HasSubstr;
+
+constexpr char const* kExtensions[] = {"png", "jpg", "webp", "mki"};
+Bytes const kOld = {'o', 'l', 'd'};
+
+// While it lives no file of this process grows beyond the limit: a full disk.
+class FullDisk {
+public:
+    explicit FullDisk(rlim_t bytes) : mSignal(std::signal(SIGXFSZ, SIG_IGN)) {
+        getrlimit(RLIMIT_FSIZE, &mBefore);
+        rlimit const limit{bytes, mBefore.rlim_max};
+        setrlimit(RLIMIT_FSIZE, &limit);
+    }
+    ~FullDisk() {
+        setrlimit(RLIMIT_FSIZE, &mBefore);
+        std::signal(SIGXFSZ, mSignal);
+    }
+
+private:
+    void (*mSignal)(int);
+    rlimit mBefore{};
+};
+
+mode_t ModeOf(std::string const& path) {
+    struct stat status = {};
+    EXPECT_EQ(stat(path.c_str(), &status), 0) << path;
+    return status.st_mode & 07777;
+}
+
+TEST(Save, AFullDiskKeepsTheOldFileAndLeavesNothingElse) {
+    ErrorLines errors;
+    // The large image fills buffers on the way, the small one is written only when the file is finished.
+    struct {
+        int side;
+        rlim_t limit;
+    } const cases[] = {{256, 0}, {256, 1000}, {256, 66000}, {6, 0}, {6, 20}};
+    for (char const* extension : kExtensions) {
+        for (auto const& [side, limit] : cases) {
+            TempFolder const folder;
+            std::string const name = std::string("page.") + extension;
+            WriteFile(folder.Path(name), kOld);
+            bool isSaved = true;
+            {
+                FullDisk const disk(limit);
+                isSaved = Save(MakeOpaqueNoise(side, side), folder.Path(name), 100);
+            }
+            EXPECT_FALSE(isSaved) << extension << ' ' << side << ' ' << limit;
+            EXPECT_THAT(errors.Take(), ElementsAre(AllOf(HasSubstr(name), HasSubstr(std::strerror(EFBIG)))));
+            EXPECT_THAT(folder.List(), ElementsAre(name));
+            EXPECT_EQ(ReadFile(folder.Path(name)), kOld);
+        }
+    }
+}
+
+TEST(Save, TargetsThatCannotBeWrittenAreRefusedWithTheReason) {
+    ErrorLines errors;
+    TempFolder const folder;
+    WriteFile(folder.Path("file"), kOld);
+    ASSERT_EQ(mkdir(folder.Path("folder.png").c_str(), 0700), 0);
+    ASSERT_EQ(mkfifo(folder.Path("pipe.png").c_str(), 0600), 0);
+    ASSERT_EQ(symlink("/dev/null", folder.Path("null.png").c_str()), 0);
+    ASSERT_EQ(symlink("loop.png", folder.Path("loop.png").c_str()), 0);
+    std::vector<std::string> const before = folder.List();
+    struct {
+        std::string path;
+        char const* reason;
+    } const cases[] = {
+        {folder.Path("missing/page.png"), "No such file"},
+        {folder.Path("file/page.png"), "Not a directory"},
+        {folder.Path("folder.png"), "it is a folder"},
+        {folder.Path("pipe.png"), "not a regular file"},
+        {folder.Path("null.png"), "not a regular file"},
+        {folder.Path("loop.png"), "symbolic links"},
+        {"/proc/page.png", "cannot"},
+        {folder.Path(std::string(300, 'n') + ".png"), "File name too long"},
+        {folder.Path("page.gif"), "unknown extension 'gif'; use png"},
+        {folder.Path("page"), "unknown extension ''"},
+    };
+    for (auto const& one : cases) {
+        EXPECT_FALSE(Save(MakeOpaqueNoise(3, 3), one.path, 100)) << one.path;
+        EXPECT_THAT(errors.Take(), ElementsAre(HasSubstr(one.reason)));
+    }
+    EXPECT_EQ(folder.List(), before);
+    if (geteuid() != 0) {
+        ASSERT_EQ(chmod(folder.Path("").c_str(), 0500), 0);
+        EXPECT_FALSE(Save(MakeOpaqueNoise(3, 3), folder.Path("page.png"), 100));
+        EXPECT_THAT(errors.Take(), ElementsAre(HasSubstr("Permission denied")));
+        ASSERT_EQ(chmod(folder.Path("").c_str(), 0700), 0);
+    }
+}
+
+TEST(Save, ImagesThatAFormatCannotHoldAreRefused) {
+    ErrorLines errors;
+    TempFolder const folder;
+    Image const wide{65535, 1, Bytes(65535 * 4, 255)};
+    EXPECT_FALSE(Save(wide, folder.Path("wide.webp"), 100));
+    EXPECT_THAT(errors.Take(), ElementsAre(AllOf(HasSubstr("16383"), HasSubstr("use png"))));
+    EXPECT_FALSE(Save(wide, folder.Path("wide.jpg"), 100));
+    EXPECT_THAT(errors.Take(), ElementsAre(HasSubstr("65500")));
+    EXPECT_FALSE(Save({65536, 1, Bytes(65536 * 4, 255)}, folder.Path("wide.png"), 100));
+    EXPECT_THAT(errors.Take(), ElementsAre(HasSubstr("65535")));
+    String const path(folder.Path("nothing.png"));
+    Bitmap const empty;
+    EXPECT_FALSE(BitmapFactory::SaveBitmap(&empty, &path, 100));
+    EXPECT_FALSE(BitmapFactory::SaveBitmap(nullptr, &path, 100));
+    EXPECT_EQ(errors.Take().size(), 2u);
+    EXPECT_THAT(folder.List(), ElementsAre());
+    for (char const* extension : {"png", "mki"}) EXPECT_EQ(Decode(Encode(wide, extension)), wide);
+}
+
+TEST(Save, ANewFileObeysTheMaskAndAReplacedOneKeepsItsMode) {
+    TempFolder const folder;
+    Image const image = MakeOpaqueNoise(5, 5);
+    mode_t const mask = umask(027);
+    EXPECT_TRUE(Save(image, folder.Path("new.png"), 100));
+    umask(mask);
+    EXPECT_EQ(ModeOf(folder.Path("new.png")), 0640u);
+    WriteFile(folder.Path("old.png"), kOld);
+    ASSERT_EQ(chmod(folder.Path("old.png").c_str(), 0604), 0);
+    EXPECT_TRUE(Save(image, folder.Path("old.png"), 100));
+    EXPECT_EQ(ModeOf(folder.Path("old.png")), 0604u);
+    EXPECT_EQ(DecodeFile(folder.Path("old.png")), image);
+    EXPECT_THAT(folder.List(), ElementsAre("new.png", "old.png"));
+}
+
+TEST(Save, GoesThroughSymbolicLinksToTheFileBehind) {
+    TempFolder const folder;
+    Image const image = MakeOpaqueNoise(5, 5);
+    ASSERT_EQ(mkdir(folder.Path("album").c_str(), 0700), 0);
+    WriteFile(folder.Path("album/real"), kOld);
+    ASSERT_EQ(symlink("album/real", folder.Path("link.png").c_str()), 0);
+    ASSERT_EQ(symlink("link.png", folder.Path("chain.png").c_str()), 0);
+    ASSERT_EQ(symlink("album/made", folder.Path("dangling.png").c_str()), 0);
+    for (char const* name : {"chain.png", "dangling.png"}) {
+        EXPECT_TRUE(Save(image, folder.Path(name), 100)) << name;
+        struct stat status = {};
+        ASSERT_EQ(lstat(folder.Path(name).c_str(), &status), 0);
+        EXPECT_TRUE(S_ISLNK(status.st_mode)) << name;
+    }
+    EXPECT_EQ(DecodeFile(folder.Path("album/real")), image);
+    EXPECT_EQ(DecodeFile(folder.Path("album/made")), image);
+}
+
+TEST(Save, AReaderOfTheOldFileKeepsWhatItOpened) {
+    TempFolder const folder;
+    std::string const path = folder.Path("page.png");
+    WriteFile(path, kOld);
+    int const old = open(path.c_str(), O_RDONLY);
+    EXPECT_TRUE(Save(MakeOpaqueNoise(5, 5), path, 100));
+    char text[4] = {};
+    EXPECT_EQ(read(old, text, 4), 3);
+    EXPECT_STREQ(text, "old");
+    close(old);
+}
+
+TEST(Save, APathWithoutAFolderMeansTheCurrentOne) {
+    TempFolder const folder;
+    std::string before(4096, '\0');
+    ASSERT_NE(getcwd(before.data(), before.size()), nullptr);
+    ASSERT_EQ(chdir(folder.Path("").c_str()), 0);
+    bool const isSaved = Save(MakeOpaqueNoise(5, 5), "page.mki", 100);
+    ASSERT_EQ(chdir(before.c_str()), 0);
+    EXPECT_TRUE(isSaved);
+    EXPECT_THAT(folder.List(), ElementsAre("page.mki"));
+}
+
+} // namespace
+} // namespace Moka::test
