@@ -1,0 +1,22 @@
+// SinCos: sine and cosine of one angle, in single precision, from one call.
+#pragma once
+
+#include <cmath>
+
+namespace Moka::detail {
+
+struct SinCos {
+    float s;
+    float c;
+
+    explicit SinCos(float radians) {
+#if defined(__GLIBC__) || defined(__ANDROID__)
+        ::sincosf(radians, &s, &c);
+#else
+        s = std::sin(radians);
+        c = std::cos(radians);
+#endif
+    }
+};
+
+} // namespace Moka::detail

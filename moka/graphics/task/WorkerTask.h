@@ -1,0 +1,131 @@
+// WorkerTask: tasks that carry a call, with copies of its arguments, or a deletion onto the render thread,
+// and the functions that post them.
+//
+// Arguments are stored by value, in the decayed type of the parameter. A reference parameter is bound to the
+// task's own copy: what a function writes through it is lost with the task, which callers rely on. A by-value
+// parameter gets a fresh copy. The object and whatever a stored pointer points to are not owned.
+#pragma once
+
+#include "moka/graphics/task/IGLMsgQueue.h"
+#include "moka/graphics/task/ITask.h"
+
+#include <tuple>
+#include <type_traits>
+#include <utility>
+
+namespace Moka::WorkerTask {
+
+// Calls a member function, virtual ones on the object's dynamic type. F is the type of the member pointer; a
+// result it returns is discarded.
+template <class T, class F, class... Arguments>
+class Member final : public ITask {
+public:
+    template <class... Values>
+    Member(T* object, F function, Values&&... values)
+        : mObject(object), mFunction(function), mArguments(std::forward<Values>(values)...) {}
+
+    void run() override { Call(std::index_sequence_for<Arguments...>()); }
+
+private:
+    // Instead of std::apply, for which one compiler warns of uninitialised memory under sanitizers.
+    template <std::size_t... Index>
+    void Call(std::index_sequence<Index...>) {
+        (mObject->*mFunction)(std::get<Index>(mArguments)...);
+    }
+
+    T* mObject;
+    F mFunction;
+    std::tuple<Arguments...> mArguments;
+};
+
+template <class T, class F>
+using Member0 = Member<T, F>;
+template <class T, class F, class A1>
+using Member1 = Member<T, F, A1>;
+template <class T, class F, class A1, class A2>
+using Member2 = Member<T, F, A1, A2>;
+template <class T, class F, class A1, class A2, class A3>
+using Member3 = Member<T, F, A1, A2, A3>;
+template <class T, class F, class A1, class A2, class A3, class A4>
+using Member4 = Member<T, F, A1, A2, A3, A4>;
+template <class T, class F, class A1, class A2, class A3, class A4, class A5>
+using Member5 = Member<T, F, A1, A2, A3, A4, A5>;
+
+// Deletes an object when run; a task that is never run leaves it alive.
+template <class T>
+class Delete final : public ITask {
+public:
+    explicit Delete(T* pointer) : mPointer(pointer) {}
+    void run() override { delete mPointer; }
+
+private:
+    T* mPointer;
+};
+
+// Frees an array when run.
+template <class T>
+class DeleteArray final : public ITask {
+public:
+    explicit DeleteArray(T* pointer) : mPointer(pointer) {}
+    void run() override { delete[] mPointer; }
+
+private:
+    T* mPointer;
+};
+
+namespace detail {
+
+template <class T, class F, class... Parameters>
+using MemberFor = Member<T, F, std::decay_t<Parameters>...>;
+
+// The member task for a function: its parameter types, decayed, are what is stored.
+template <class T, class F>
+struct TaskFor;
+template <class T, class R, class C, class... P>
+struct TaskFor<T, R (C::*)(P...)> {
+    using Type = MemberFor<T, R (C::*)(P...), P...>;
+};
+template <class T, class R, class C, class... P>
+struct TaskFor<T, R (C::*)(P...) const> {
+    using Type = MemberFor<T, R (C::*)(P...) const, P...>;
+};
+template <class T, class R, class C, class... P>
+struct TaskFor<T, R (C::*)(P...) noexcept> {
+    using Type = MemberFor<T, R (C::*)(P...) noexcept, P...>;
+};
+template <class T, class R, class C, class... P>
+struct TaskFor<T, R (C::*)(P...) const noexcept> {
+    using Type = MemberFor<T, R (C::*)(P...) const noexcept, P...>;
+};
+
+} // namespace detail
+
+// Hands a task over and destroys it at once when the queue refuses it. A null task (memory ran out) is still
+// offered, so that the queue sees the attempt, and counts as refused.
+inline bool PostOrDestroy(IGLMsgQueue* queue, ITask* task) {
+    if (queue->Post(task)) return task != nullptr;
+    delete task;
+    return false;
+}
+
+// Posts object->function(values...). What the caller did ahead of it (a reference taken for the task) is not
+// undone when the queue refuses: the object then stays alive for good, by design.
+template <class T, class F, class... Values>
+bool PostMember(IGLMsgQueue* queue, T* object, F function, Values&&... values) {
+    using Task = typename detail::TaskFor<T, F>::Type;
+    return PostOrDestroy(queue, new (std::nothrow) Task(object, function, std::forward<Values>(values)...));
+}
+
+// Posts the deletion of a render-side object; refused, the object leaks rather than dying on the wrong
+// thread.
+template <class T>
+bool PostDelete(IGLMsgQueue* queue, T* pointer) {
+    return PostOrDestroy(queue, new (std::nothrow) Delete<T>(pointer));
+}
+
+template <class T>
+bool PostDeleteArray(IGLMsgQueue* queue, T* pointer) {
+    return PostOrDestroy(queue, new (std::nothrow) DeleteArray<T>(pointer));
+}
+
+} // namespace Moka::WorkerTask

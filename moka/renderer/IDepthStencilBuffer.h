@@ -1,0 +1,17 @@
+// IDepthStencilBuffer: one combined depth and stencil buffer, to be attached to a render target of its size.
+// Owner:  whoever created it, until Release(). Release it after detaching; released while attached, it is
+//         detached first.
+// Thread: render thread.
+#pragma once
+
+namespace Moka {
+
+class IDepthStencilBuffer {
+public:
+    virtual void Release() = 0;
+
+protected:
+    ~IDepthStencilBuffer() = default;
+};
+
+} // namespace Moka

@@ -1,0 +1,21 @@
+// IRendererDeviceCaps: what the device can do, read once when the render thread's context is made.
+// Thread: any, without GL. Before a context exists it answers with what every OpenGL ES 3.0 device offers.
+// GetMaxTextureSize stands right behind the destructor; that place is part of the contract.
+#pragma once
+
+namespace Moka {
+
+class IRendererDeviceCaps {
+public:
+    virtual ~IRendererDeviceCaps() = default;
+
+    // The largest texture side in texels, lowered by RendererLimits; 4096 before a context exists.
+    virtual int GetMaxTextureSize() const = 0;
+
+    // The driver's own strings; empty before a context exists. Valid for the life of the process.
+    virtual char const* GetVendor() const = 0;
+    virtual char const* GetRenderer() const = 0;
+    virtual char const* GetVersion() const = 0;
+};
+
+} // namespace Moka

@@ -1,0 +1,73 @@
+// RendererFactory: makes every GPU object. The implementation is chosen when linking; see README.md here.
+// Thread: render thread, except where a line says otherwise. Debug builds check it.
+// Fails:  null or false and one error line with the driver's text; never an exception.
+#pragma once
+
+#include "moka/base/Export.h"
+#include "moka/renderer/PixelBuffer.h"
+#include "moka/renderer/RendererStatistics.h"
+#include "moka/renderer/TextureDescriptor.h"
+#include "moka/renderer/TextureParameter.h"
+
+namespace Moka {
+
+class IDepthStencilBuffer;
+class IRendererDeviceCaps;
+class IRenderTarget;
+class ITextureObject;
+
+// Lowers what the device offers, so that the cutting of tall images can be seen with small ones.
+struct RendererLimits {
+    int maxTextureSize = 0; // texels; 0 keeps the device's own
+};
+
+// How the context's owner looks up entry points by name (eglGetProcAddress has this type).
+using RendererProcLoader = void (*(*)(char const* name))();
+
+class MOKA_API RendererFactory {
+public:
+    // Called by the owner of the context, on the render thread with the context current, once before anything
+    // else and once after everything. Attach reads the device's capabilities and resets the statistics; false
+    // (one error line) when the context is not OpenGL ES 3.0 or another one is attached. Without a loader
+    // there are no driver messages and no object labels. Detach deletes pooled and orphaned GL names; objects
+    // that are still alive become inert and may be released later.
+    static bool AttachContext(RendererLimits const& limits = {}, RendererProcLoader loader = nullptr);
+    static void DetachContext();
+
+    // Any thread. Never null.
+    static IRendererDeviceCaps const* GetRendererDeviceCaps();
+    // Any thread: whether the driver's renderer string is exactly name.
+    static bool IsGPUNameEqualTo(char const* name);
+
+    // The texture starts with source's pixels (transparent without), explicit linear filters, clamp to edge,
+    // and then the parameters in order. Null when the descriptor is empty or too large for the device.
+    static ITextureObject* CreateTextureObject(TextureDescriptor const& descriptor,
+                                               TextureParameter const* parameters, int parameterCount,
+                                               PixelSource const& source);
+
+    // The texture outlives the target's use; its storage is kept alive by the target.
+    static IRenderTarget* CreateOffscreenRenderTarget(ITextureObject* texture);
+
+    // The frame buffer the host gives as the default one, or the one bound right now; captured at this
+    // moment.
+    static IRenderTarget* CreateRenderTargetFromDefault(int width, int height);
+    static IRenderTarget* CreateRenderTargetFromCurrent(int width, int height);
+
+    static IDepthStencilBuffer* CreateDepthStencilBuffer(int width, int height);
+
+    // While deferred, the host's frame buffer is given back by Flush() instead of at every deactivation. Off
+    // until switched on; a host switches it on when it calls Flush() whenever its queue runs empty.
+    static void SetDeferred(bool on);
+
+    // Before foreign GL: everything asked for so far has reached GL. The host's frame buffers, viewport,
+    // culling, depth test and dither are as they were, pixel store holds GL's defaults, no sampler is bound;
+    // texture bindings are not given back. An active target stays the active one.
+    static void Flush();
+    // After foreign GL: forgets what the renderer believed the GL state to be.
+    static void InvalidateState();
+
+    // Any thread: a snapshot.
+    static RendererStatistics GetStatistics();
+};
+
+} // namespace Moka

@@ -1,0 +1,108 @@
+#include "moka/renderer/gles/GlDebug.h"
+
+#include "moka/base/log/AndroidLog.h"
+#include "moka/renderer/gles/GlStatistics.h"
+
+#include <algorithm>
+#include <cstring>
+
+namespace Moka::detail {
+namespace {
+
+bool HasExtension(char const* name) {
+    GLint count = 0;
+    glGetIntegerv(GL_NUM_EXTENSIONS, &count);
+    for (GLint i = 0; i < count; ++i) {
+        auto const* const text =
+            reinterpret_cast<char const*>(glGetStringi(GL_EXTENSIONS, static_cast<GLuint>(i)));
+        if (text && std::strcmp(text, name) == 0) return true;
+    }
+    return false;
+}
+
+// One driver gives high severity to its advice on speed, such as "stall due to ReadPixels".
+bool IsError(GLenum type, GLenum severity) {
+    return type == GL_DEBUG_TYPE_ERROR_KHR ||
+           (severity == GL_DEBUG_SEVERITY_HIGH_KHR && type != GL_DEBUG_TYPE_PERFORMANCE_KHR);
+}
+
+void GL_APIENTRY OnMessage(GLenum, GLenum type, GLuint, GLenum severity, GLsizei, GLchar const* message,
+                           void const* statistics) {
+    if (!IsError(type, severity)) return;
+    ++static_cast<GlStatistics*>(const_cast<void*>(statistics))->errors;
+    __android_log_print(ANDROID_LOG_ERROR, "mok_log", "GL driver: %s", message);
+}
+
+char const* NameOf(GLenum error) {
+    switch (error) {
+    case GL_INVALID_ENUM:
+        return "invalid enum";
+    case GL_INVALID_VALUE:
+        return "invalid value";
+    case GL_INVALID_OPERATION:
+        return "invalid operation";
+    case GL_INVALID_FRAMEBUFFER_OPERATION:
+        return "invalid frame buffer operation";
+    case GL_OUT_OF_MEMORY:
+        return "out of memory";
+    default:
+        return "unknown";
+    }
+}
+
+} // namespace
+
+void GlDebug::Attach(RendererProcLoader loader) {
+    if (!loader || !HasExtension("GL_KHR_debug")) return;
+    mObjectLabel = reinterpret_cast<PFNGLOBJECTLABELKHRPROC>(loader("glObjectLabelKHR"));
+    glGetIntegerv(GL_MAX_LABEL_LENGTH_KHR, &mMaxLabelLength);
+    // Debug output starts switched on in debug contexts and off in others, and a driver may spend time on
+    // messages that nobody asked for.
+    if (glIsEnabled(GL_DEBUG_OUTPUT_KHR)) InstallCallback(loader);
+}
+
+void GlDebug::InstallCallback(RendererProcLoader loader) {
+    auto const getPointer = reinterpret_cast<PFNGLGETPOINTERVKHRPROC>(loader("glGetPointervKHR"));
+    auto const setCallback =
+        reinterpret_cast<PFNGLDEBUGMESSAGECALLBACKKHRPROC>(loader("glDebugMessageCallbackKHR"));
+    if (!getPointer || !setCallback) return;
+    void* installed = nullptr;
+    getPointer(GL_DEBUG_CALLBACK_FUNCTION_KHR, &installed);
+    if (installed) return;
+    mSetCallback = setCallback;
+    mSetCallback(OnMessage, &mStatistics);
+    // Without it a driver may call from threads of its own, after the call that was at fault.
+    glEnable(GL_DEBUG_OUTPUT_SYNCHRONOUS_KHR);
+}
+
+void GlDebug::Detach() {
+    if (mSetCallback) mSetCallback(nullptr, nullptr);
+    mSetCallback = nullptr;
+    mObjectLabel = nullptr;
+}
+
+void GlDebug::Label(GLenum identifier, GLuint name, char const* text) const {
+    if (!mObjectLabel) return;
+    // The limit counts the terminating zero.
+    std::size_t const length =
+        std::min<std::size_t>(std::strlen(text), static_cast<std::size_t>(std::max(mMaxLabelLength - 1, 0)));
+    mObjectLabel(identifier, name, static_cast<GLsizei>(length), text);
+}
+
+bool GlDebug::Check(char const* doing) {
+    bool clean = true;
+    for (GLenum error = glGetError(); error != GL_NO_ERROR; error = glGetError()) {
+        // A lost context reports its loss for ever.
+        constexpr GLenum kContextLost = 0x0507;
+        clean = false;
+        if (!mSetCallback) {
+            ++mStatistics.errors;
+            __android_log_print(ANDROID_LOG_ERROR, "mok_log", "GL error 0x%04x (%s) %s", error, NameOf(error),
+                                doing);
+        }
+        if (error == kContextLost) break;
+    }
+    return clean;
+}
+
+} // namespace Moka::detail

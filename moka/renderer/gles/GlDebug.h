@@ -1,0 +1,42 @@
+// GlDebug: what the driver has to say: KHR_debug messages, object labels, and GL errors.
+// Thread: render thread.
+// Fails:  silently; a driver without KHR_debug has no messages and no labels.
+#pragma once
+
+#include "moka/renderer/RendererFactory.h"
+
+#include <GLES3/gl3.h>
+// The prototypes of extensions come after the core header.
+#include <GLES2/gl2ext.h>
+
+namespace Moka::detail {
+
+struct GlStatistics;
+
+class GlDebug {
+public:
+    explicit GlDebug(GlStatistics& statistics) : mStatistics(statistics) {}
+
+    // In a debug context whose owner has not set a callback, messages of error severity go to the log and
+    // into the statistics.
+    void Attach(RendererProcLoader loader);
+    void Detach();
+
+    // identifier: GL_TEXTURE and so on. Longer labels than the driver takes are cut.
+    void Label(GLenum identifier, GLuint name, char const* text) const;
+
+    // Takes the pending GL errors; false when there were any. They are logged with what was being done, and
+    // counted, unless the driver's own message has been already. For places where the call costs nothing
+    // beside the work, never for a draw.
+    bool Check(char const* doing);
+
+private:
+    void InstallCallback(RendererProcLoader loader);
+
+    GlStatistics& mStatistics;
+    PFNGLOBJECTLABELKHRPROC mObjectLabel = nullptr;
+    PFNGLDEBUGMESSAGECALLBACKKHRPROC mSetCallback = nullptr; // null: none of ours is installed
+    GLint mMaxLabelLength = 0;
+};
+
+} // namespace Moka::detail

@@ -1,0 +1,55 @@
+// GlRenderTarget: a render target over a texture or over a frame buffer of the host's.
+#pragma once
+
+#include "moka/renderer/IRenderTarget.h"
+
+#include <GLES3/gl3.h>
+
+#include <memory>
+
+namespace Moka::detail {
+
+class GlContext;
+class GlDepthStencil;
+class GlFrameBuffer;
+class GlTextureStorage;
+
+class GlRenderTarget final : public IRenderTarget {
+public:
+    GlRenderTarget(std::shared_ptr<GlContext> context, std::shared_ptr<GlFrameBuffer> frameBuffer, int width,
+                   int height);
+    GlRenderTarget(GlRenderTarget const&) = delete;
+    ~GlRenderTarget();
+    GlRenderTarget& operator=(GlRenderTarget const&) = delete;
+
+    void Activate() override;
+    void Deactivate(bool discardColor, bool discardDepthStencil) override;
+    void ReadPixels(int x, int y, int width, int height, PixelDestination const& destination) override;
+    void Release() override;
+    void ClearColor(float r, float g, float b, float a) override;
+    void AttachDepthStencil(IDepthStencilBuffer* buffer) override;
+    void DetachDepthStencil() override;
+    void ClearDepthStencil(bool clearDepth, float depth, bool clearStencil, int stencil) override;
+
+    GLuint GetName() const;
+    int GetWidth() const { return mWidth; }
+    int GetHeight() const { return mHeight; }
+    // Null for a host's frame buffer.
+    GlTextureStorage const* GetStorage() const;
+    std::shared_ptr<GlFrameBuffer> const& GetFrameBuffer() const { return mFrameBuffer; }
+
+    // Within an operation: no depth-stencil buffer afterwards.
+    void Detach();
+
+private:
+    bool MayAttach(GlDepthStencil const& buffer) const;
+    void Discard(bool color, bool depthStencil) const;
+
+    std::shared_ptr<GlContext> const mContext;
+    std::shared_ptr<GlFrameBuffer> const mFrameBuffer;
+    int const mWidth;
+    int const mHeight;
+    GlDepthStencil* mDepthStencil = nullptr; // attached, not owned
+};
+
+} // namespace Moka::detail

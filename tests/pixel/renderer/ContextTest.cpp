@@ -1,0 +1,197 @@
+// The renderer's life in a context: attaching, limits, foreign GL in between, deferral, and what is left
+// when the context goes first.
+#include "tests/pixel/renderer/RendererFixture.h"
+
+#include "moka/renderer/IRendererDeviceCaps.h"
+
+#include <thread>
+
+namespace Moka::Testing {
+namespace {
+
+class ContextTest : public RendererFixture {
+protected:
+    static void Reattach(RendererLimits const& limits) {
+        RendererFactory::DetachContext();
+        ASSERT_TRUE(Attach(limits));
+    }
+};
+
+TEST_F(ContextTest, CapabilitiesAreTheDriversAndAskedForAnywhere) {
+    IRendererDeviceCaps const* const caps = RendererFactory::GetRendererDeviceCaps();
+    int const largest = GetInteger(GL_MAX_TEXTURE_SIZE);
+    std::string const renderer = reinterpret_cast<char const*>(glGetString(GL_RENDERER));
+    std::thread([&] {
+        EXPECT_EQ(caps->GetMaxTextureSize(), largest);
+        EXPECT_EQ(caps->GetRenderer(), renderer);
+        EXPECT_TRUE(RendererFactory::IsGPUNameEqualTo(renderer.c_str()));
+        EXPECT_FALSE(RendererFactory::IsGPUNameEqualTo((renderer + " ").c_str()));
+        EXPECT_FALSE(RendererFactory::IsGPUNameEqualTo(""));
+        EXPECT_FALSE(RendererFactory::IsGPUNameEqualTo(nullptr));
+    }).join();
+    EXPECT_STRNE(caps->GetVendor(), "");
+    EXPECT_EQ(std::string(caps->GetVersion()).rfind("OpenGL ES 3", 0), 0u);
+}
+
+TEST_F(ContextTest, LimitsLowerTheDeviceButNeverRaiseIt) {
+    int const device = GetInteger(GL_MAX_TEXTURE_SIZE);
+    IRendererDeviceCaps const* const caps = RendererFactory::GetRendererDeviceCaps();
+    Reattach({16});
+    EXPECT_EQ(caps->GetMaxTextureSize(), 16);
+    EXPECT_TRUE(MakeTexture(16, 16));
+    EXPECT_FALSE(MakeTexture(17, 1));
+    EXPECT_EQ(TakeErrors().size(), 1u);
+    Reattach({device * 2});
+    EXPECT_EQ(caps->GetMaxTextureSize(), device);
+}
+
+TEST_F(ContextTest, ASecondAttachIsRefusedAndTheFirstGoesOn) {
+    EXPECT_FALSE(Attach());
+    EXPECT_EQ(TakeErrors().size(), 1u);
+    EXPECT_TRUE(MakeTexture(2, 2));
+}
+
+TEST_F(ContextTest, WithoutAContextNothingIsMade) {
+    RendererFactory::DetachContext();
+    RendererFactory::DetachContext();
+    EXPECT_FALSE(MakeTexture(2, 2));
+    EXPECT_FALSE(RendererFactory::CreateRenderTargetFromCurrent(2, 2));
+    EXPECT_FALSE(RendererFactory::CreateRenderTargetFromDefault(2, 2));
+    EXPECT_FALSE(RendererFactory::CreateDepthStencilBuffer(2, 2));
+    RendererFactory::Flush();
+    RendererFactory::InvalidateState();
+    EXPECT_EQ(TakeErrors().size(), 4u);
+}
+
+TEST_F(ContextTest, ObjectsThatOutliveTheirContextAreInertInTheNextOne) {
+    TexturePtr texture = MakeTexture(Image(4, 4, kRed));
+    TexturePtr elsewhere = MakeTexture(Image(4, 4, kRed));
+    TargetPtr target = MakeTarget(*texture);
+    DepthStencilPtr buffer = MakeDepthStencil(4, 4);
+    target->AttachDepthStencil(buffer.get());
+    target->Activate();
+    RendererFactory::DetachContext();
+    RestartEgl();
+    ASSERT_TRUE(Attach());
+
+    // The new context hands out the same small names again.
+    std::vector<TexturePtr> strangers;
+    for (int i = 0; i < 4; ++i) strangers.push_back(MakeTexture(Image(4, 4, kGreen)));
+    TargetPtr const strangersTarget = MakeTarget(*strangers[0]);
+    DepthStencilPtr const strangersBuffer = MakeDepthStencil(4, 4);
+    strangersTarget->AttachDepthStencil(strangersBuffer.get());
+
+    texture->SetLabel("old");
+    texture->Bind(0);
+    texture->Replace(Image(4, 4, kBlue).pixels.data(), 0);
+    texture->DrawToCurrent();
+    texture->CopyFromRenderTarget();
+    target->Activate();
+    target->ClearColor(0, 0, 1, 1);
+    target->ClearDepthStencil(true, 1, true, 1);
+    EXPECT_EQ(Read(*target, 4, 4), Image(4, 4));
+    target->Deactivate(true, true);
+    EXPECT_FALSE(MakeView(*texture));
+    EXPECT_FALSE(MakeTarget(*texture));
+    EXPECT_EQ(TakeErrors().size(), 2u);
+    std::thread([&] { elsewhere.reset(); }).join();
+    buffer.reset();
+    target.reset();
+    texture.reset();
+    RendererFactory::Flush();
+
+    for (TexturePtr const& stranger : strangers) EXPECT_EQ(Read(*stranger), Image(4, 4, kGreen));
+    EXPECT_EQ(RendererFactory::GetStatistics().textures, 4);
+    EXPECT_EQ(RendererFactory::GetStatistics().renderTargets, 1);
+}
+
+TEST_F(ContextTest, DetachingGivesTheHostItsFrameBufferBackAndDeletesWhatWaits) {
+    HostFrameBuffer const host(4, 4);
+    RendererFactory::SetDeferred(true);
+    TexturePtr texture = MakeTexture(Image(4, 4, kRed));
+    TargetPtr target = MakeTarget(*texture);
+    MakeDepthStencil(4, 4).reset();
+    target->Activate();
+    target.reset();
+    texture->Bind(0);
+    glActiveTexture(GL_TEXTURE0);
+    auto const name = static_cast<GLuint>(GetInteger(GL_TEXTURE_BINDING_2D));
+    std::thread([&] { texture.reset(); }).join();
+    RendererFactory::DetachContext();
+    EXPECT_FALSE(glIsTexture(name));
+    EXPECT_EQ(GetInteger(GL_DRAW_FRAMEBUFFER_BINDING), static_cast<GLint>(host.GetName()));
+    RendererStatistics const left = RendererFactory::GetStatistics();
+    EXPECT_EQ(left.textures + left.frameBuffers + left.samplers + left.pooledRenderBuffers, 0);
+}
+
+TEST_F(ContextTest, DeferredTheHostGetsItsFrameBufferBackAtTheFlushOnly) {
+    HostFrameBuffer const host(4, 4);
+    glViewport(1, 2, 3, 4);
+    RendererFactory::InvalidateState();
+    RendererFactory::SetDeferred(true);
+    TexturePtr const texture = MakeTexture(4, 4);
+    TargetPtr const target = MakeTarget(*texture);
+    RendererFactory::Flush();
+    std::uint64_t const before = RendererFactory::GetStatistics().frameBufferSwitches;
+    for (int i = 0; i < 10; ++i) {
+        target->Activate();
+        target->Deactivate(false, false);
+        Clear(*target, kRed);
+    }
+    EXPECT_EQ(RendererFactory::GetStatistics().frameBufferSwitches, before + 1);
+    RendererFactory::Flush();
+    EXPECT_EQ(GetInteger(GL_DRAW_FRAMEBUFFER_BINDING), static_cast<GLint>(host.GetName()));
+    EXPECT_EQ(GetViewport(), (std::vector<GLint>{1, 2, 3, 4}));
+
+    target->Activate();
+    target->Deactivate(false, false);
+    RendererFactory::SetDeferred(false);
+    EXPECT_EQ(GetInteger(GL_DRAW_FRAMEBUFFER_BINDING), static_cast<GLint>(host.GetName()));
+}
+
+TEST_F(ContextTest, ForeignGlBetweenFlushAndInvalidateBreaksNothing) {
+    for (bool deferred : {false, true}) {
+        RendererFactory::SetDeferred(deferred);
+        TexturePtr const texture = MakeTexture(Image(4, 4, kGreen));
+        TexturePtr const otherTexture = MakeTexture(Image(4, 4, kRed));
+        TargetPtr const target = MakeTarget(*texture);
+        target->Activate();
+        Clear(*target, kBlue);
+
+        RendererFactory::Flush();
+        HostFrameBuffer const foreign(4, 4);
+        glViewport(0, 0, 1, 1);
+        glEnable(GL_SCISSOR_TEST);
+        glScissor(0, 0, 0, 0);
+        glColorMask(GL_FALSE, GL_FALSE, GL_FALSE, GL_FALSE);
+        glPixelStorei(GL_UNPACK_ROW_LENGTH, 1);
+        RendererFactory::InvalidateState();
+
+        // The target is still the active one.
+        otherTexture->DrawToCurrent();
+        EXPECT_EQ(GetViewport(), (std::vector<GLint>{0, 0, 4, 4}));
+        EXPECT_EQ(Read(*target, 4, 4), Image(4, 4, kRed));
+        texture->Replace(Image::Pattern(4, 4).pixels.data(), 0);
+        EXPECT_EQ(Read(*target, 4, 4), Image::Pattern(4, 4));
+        target->Deactivate(false, false);
+        RendererFactory::Flush();
+        EXPECT_EQ(GetInteger(GL_DRAW_FRAMEBUFFER_BINDING), static_cast<GLint>(foreign.GetName()));
+        glDisable(GL_SCISSOR_TEST);
+        glColorMask(GL_TRUE, GL_TRUE, GL_TRUE, GL_TRUE);
+        EXPECT_EQ(foreign.Read(), Image(4, 4));
+        RendererFactory::InvalidateState();
+    }
+}
+
+#if defined(MOKA_CHECKS) && MOKA_CHECKS
+using ContextDeathTest = ContextTest;
+
+TEST_F(ContextDeathTest, UseOnAnotherThreadIsABrokenContract) {
+    ::testing::FLAGS_gtest_death_test_style = "threadsafe";
+    TexturePtr const texture = MakeTexture(2, 2);
+    EXPECT_DEATH(std::thread([&] { texture->Bind(0); }).join(), "");
+}
+#endif
+
+} // namespace
+} // namespace Moka::Testing

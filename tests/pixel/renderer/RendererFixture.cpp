@@ -1,0 +1,219 @@
+#include "tests/pixel/renderer/RendererFixture.h"
+
+#include "moka/base/log/AndroidLog.h"
+#include "moka/base/log/LogSink.h"
+
+#include <ostream>
+#include <utility>
+
+namespace Moka::Testing {
+
+std::ostream& operator<<(std::ostream& out, Pixel const& pixel) {
+    return out << '(' << int{pixel.r} << ' ' << int{pixel.g} << ' ' << int{pixel.b} << ' ' << int{pixel.a}
+               << ')';
+}
+
+Image Image::Pattern(int width, int height) {
+    Image image(width, height);
+    for (int y = 0; y < height; ++y) {
+        for (int x = 0; x < width; ++x) {
+            auto const high = static_cast<std::uint8_t>((x >> 8) * 16 + (y >> 8));
+            image.At(x, y) = {static_cast<std::uint8_t>(x), static_cast<std::uint8_t>(y), high,
+                              static_cast<std::uint8_t>(7 * x + 13 * y + 1)};
+        }
+    }
+    return image;
+}
+
+Image Image::With(int x, int y, Image const& source, int sourceX, int sourceY, int w, int h) const {
+    Image result = *this;
+    for (int row = 0; row < h; ++row) {
+        for (int column = 0; column < w; ++column) {
+            result.At(x + column, y + row) = source.At(sourceX + column, sourceY + row);
+        }
+    }
+    return result;
+}
+
+void PrintTo(Image const& image, std::ostream* out) {
+    *out << image.width << " x " << image.height;
+    if (image.pixels.size() > 256) return;
+    for (int y = 0; y < image.height; ++y) {
+        *out << "\n  ";
+        for (int x = 0; x < image.width; ++x) *out << image.At(x, y);
+    }
+}
+
+HostFrameBuffer::HostFrameBuffer(int width, int height, GLenum format) : mWidth(width), mHeight(height) {
+    glGenRenderbuffers(1, &mColor);
+    glBindRenderbuffer(GL_RENDERBUFFER, mColor);
+    glRenderbufferStorage(GL_RENDERBUFFER, format, width, height);
+    glGenFramebuffers(1, &mName);
+    glBindFramebuffer(GL_FRAMEBUFFER, mName);
+    glFramebufferRenderbuffer(GL_FRAMEBUFFER, GL_COLOR_ATTACHMENT0, GL_RENDERBUFFER, mColor);
+    EXPECT_EQ(glCheckFramebufferStatus(GL_FRAMEBUFFER), GLenum{GL_FRAMEBUFFER_COMPLETE});
+    Fill(kUntouched);
+}
+
+HostFrameBuffer::~HostFrameBuffer() {
+    glDeleteFramebuffers(1, &mName);
+    glDeleteRenderbuffers(1, &mColor);
+}
+
+void HostFrameBuffer::Fill(Pixel color) const {
+    glBindFramebuffer(GL_FRAMEBUFFER, mName);
+    GLfloat const value[4] = {static_cast<float>(color.r) / 255, static_cast<float>(color.g) / 255,
+                              static_cast<float>(color.b) / 255, static_cast<float>(color.a) / 255};
+    glClearBufferfv(GL_COLOR, 0, value);
+}
+
+Image HostFrameBuffer::Read() const {
+    Image image(mWidth, mHeight);
+    glBindFramebuffer(GL_FRAMEBUFFER, mName);
+    glReadPixels(0, 0, mWidth, mHeight, GL_RGBA, GL_UNSIGNED_BYTE, image.pixels.data());
+    return image;
+}
+
+RendererFixture::RendererFixture() {
+    SetLogSink([this](LogLine const& line) {
+        if (line.priority >= ANDROID_LOG_ERROR) mErrors.push_back(line.text);
+    });
+}
+
+RendererFixture::~RendererFixture() { SetLogSink(nullptr); }
+
+void RendererFixture::SetUp() {
+    std::string error;
+    mEgl = EglContext::Create(true, &error);
+    ASSERT_TRUE(mEgl) << error;
+    ASSERT_TRUE(Attach());
+}
+
+void RendererFixture::TearDown() {
+    if (!mEgl) return;
+    RendererStatistics const left = RendererFactory::GetStatistics();
+    EXPECT_EQ(left.textures, 0);
+    EXPECT_EQ(left.samplers, 0);
+    EXPECT_EQ(left.frameBuffers, 0);
+    EXPECT_EQ(left.renderBuffers, 0);
+    EXPECT_EQ(left.renderTargets, 0);
+    EXPECT_EQ(left.textureObjects, 0);
+    EXPECT_EQ(left.depthStencilBuffers, 0);
+    EXPECT_EQ(left.errors, mKnownDriverErrors);
+    RendererFactory::DetachContext();
+    EXPECT_EQ(RendererFactory::GetStatistics().pooledRenderBuffers, 0);
+    EXPECT_EQ(glGetError(), GLenum{GL_NO_ERROR});
+    EXPECT_EQ(TakeErrors(), std::vector<std::string>{});
+}
+
+bool RendererFixture::Attach(RendererLimits const& limits) {
+    return RendererFactory::AttachContext(limits, eglGetProcAddress);
+}
+
+TexturePtr RendererFixture::MakeTexture(int width, int height) {
+    TextureDescriptor const descriptor(width, height, 0, 2, 6, 1, false, nullptr);
+    return TexturePtr(RendererFactory::CreateTextureObject(descriptor, nullptr, 0, {}));
+}
+
+TexturePtr RendererFixture::MakeTexture(Image const& image) {
+    TextureDescriptor const descriptor(image.width, image.height, 0, 2, 6, 1, false, nullptr);
+    PixelSource const source{image.pixels.data(), 0, 0, image.width};
+    return TexturePtr(RendererFactory::CreateTextureObject(descriptor, nullptr, 0, source));
+}
+
+TexturePtr RendererFixture::MakeView(ITextureObject const& model) {
+    return TexturePtr(RendererFactory::CreateTextureObject(TextureDescriptor(&model), nullptr, 0, {}));
+}
+
+TargetPtr RendererFixture::MakeTarget(ITextureObject& texture) {
+    return TargetPtr(RendererFactory::CreateOffscreenRenderTarget(&texture));
+}
+
+DepthStencilPtr RendererFixture::MakeDepthStencil(int width, int height) {
+    return DepthStencilPtr(RendererFactory::CreateDepthStencilBuffer(width, height));
+}
+
+Image RendererFixture::Read(IRenderTarget& target, int width, int height) {
+    Image image(width, height);
+    target.ReadPixels(0, 0, width, height, {image.pixels.data(), width, 0, 0});
+    return image;
+}
+
+Image RendererFixture::Read(ITextureObject& texture) {
+    return Read(*MakeTarget(texture), texture.GetWidth(), texture.GetHeight());
+}
+
+void RendererFixture::Clear(IRenderTarget& target, Pixel color) {
+    target.ClearColor(static_cast<float>(color.r) / 255, static_cast<float>(color.g) / 255,
+                      static_cast<float>(color.b) / 255, static_cast<float>(color.a) / 255);
+}
+
+std::vector<std::string> RendererFixture::TakeErrors() { return std::exchange(mErrors, {}); }
+
+void RendererFixture::ForgetDriverErrors() { mKnownDriverErrors = RendererFactory::GetStatistics().errors; }
+
+void RendererFixture::RestartEgl() {
+    mEgl.reset();
+    std::string error;
+    mEgl = EglContext::Create(true, &error);
+    ASSERT_TRUE(mEgl) << error;
+}
+
+RawQuad::RawQuad(char const* fragment) {
+    std::string const vertexText =
+        "#version 300 es\n"
+        "in vec2 corner; out highp vec2 at;\n"
+        "void main() { at = corner; gl_Position = vec4(corner * 2.0 - 1.0, 0, 1); }";
+    std::string const fragmentText = std::string("#version 300 es\n"
+                                                 "precision highp float; in highp vec2 at; out vec4 color;\n"
+                                                 "uniform highp sampler2D texel;\n"
+                                                 "void main() { ") +
+                                     fragment + " }";
+    mProgram = glCreateProgram();
+    for (auto const& [kind, text] : {std::pair<GLenum, std::string const*>{GL_VERTEX_SHADER, &vertexText},
+                                     {GL_FRAGMENT_SHADER, &fragmentText}}) {
+        GLuint const shader = glCreateShader(kind);
+        char const* const source = text->c_str();
+        glShaderSource(shader, 1, &source, nullptr);
+        glCompileShader(shader);
+        glAttachShader(mProgram, shader);
+        glDeleteShader(shader);
+    }
+    glBindAttribLocation(mProgram, 0, "corner");
+    glLinkProgram(mProgram);
+    GLint linked = GL_FALSE;
+    glGetProgramiv(mProgram, GL_LINK_STATUS, &linked);
+    EXPECT_EQ(linked, GL_TRUE) << fragment;
+    // Counter-clockwise, so that the front is seen.
+    GLfloat const corners[] = {0, 0, 1, 0, 0, 1, 1, 1};
+    glGenBuffers(1, &mVertices);
+    glBindBuffer(GL_ARRAY_BUFFER, mVertices);
+    glBufferData(GL_ARRAY_BUFFER, sizeof corners, corners, GL_STATIC_DRAW);
+}
+
+RawQuad::~RawQuad() {
+    glDeleteProgram(mProgram);
+    glDeleteBuffers(1, &mVertices);
+}
+
+void RawQuad::Draw() const {
+    glUseProgram(mProgram);
+    glBindBuffer(GL_ARRAY_BUFFER, mVertices);
+    glEnableVertexAttribArray(0);
+    glVertexAttribPointer(0, 2, GL_FLOAT, GL_FALSE, 0, nullptr);
+    glDrawArrays(GL_TRIANGLE_STRIP, 0, 4);
+}
+
+GLint GetInteger(GLenum name) {
+    GLint value = 0;
+    glGetIntegerv(name, &value);
+    return value;
+}
+
+std::vector<GLint> GetViewport() {
+    std::vector<GLint> viewport(4);
+    glGetIntegerv(GL_VIEWPORT, viewport.data());
+    return viewport;
+}
+
+} // namespace Moka::Testing

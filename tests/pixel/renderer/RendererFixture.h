@@ -1,0 +1,139 @@
+// RendererFixture: the renderer over a real driver, one fresh context a test, and what every test must leave
+// behind: no object of any kind, no GL error, no log line that it did not expect.
+#pragma once
+
+#include "moka/renderer/IDepthStencilBuffer.h"
+#include "moka/renderer/IRenderTarget.h"
+#include "moka/renderer/ITextureObject.h"
+#include "moka/renderer/RendererFactory.h"
+#include "tests/support/EglContext.h"
+
+#include <GLES3/gl3.h>
+#include <gtest/gtest.h>
+
+#include <cstdint>
+#include <iosfwd>
+#include <memory>
+#include <string>
+#include <vector>
+
+namespace Moka::Testing {
+
+struct Pixel {
+    std::uint8_t r = 0, g = 0, b = 0, a = 0;
+    friend bool operator==(Pixel const& x, Pixel const& y) {
+        return x.r == y.r && x.g == y.g && x.b == y.b && x.a == y.a;
+    }
+};
+std::ostream& operator<<(std::ostream& out, Pixel const& pixel);
+
+constexpr Pixel kClear{};
+constexpr Pixel kRed{255, 0, 0, 255};
+constexpr Pixel kGreen{0, 255, 0, 255};
+constexpr Pixel kBlue{0, 0, 255, 255};
+constexpr Pixel kUntouched{0xEE, 0xDD, 0xCC, 0xBB};
+
+struct Image {
+    int width;
+    int height;
+    std::vector<Pixel> pixels;
+
+    Image(int w, int h, Pixel fill = kUntouched)
+        : width(w), height(h), pixels(static_cast<std::size_t>(w) * static_cast<std::size_t>(h), fill) {}
+    Pixel& At(int x, int y) { return pixels[static_cast<std::size_t>(y * width + x)]; }
+    Pixel At(int x, int y) const { return pixels[static_cast<std::size_t>(y * width + x)]; }
+    friend bool operator==(Image const& a, Image const& b) {
+        return a.width == b.width && a.height == b.height && a.pixels == b.pixels;
+    }
+
+    // Every pixel different from every other.
+    static Image Pattern(int width, int height);
+    // This image with a block of another's in the place of its own.
+    Image With(int x, int y, Image const& source, int sourceX, int sourceY, int w, int h) const;
+};
+void PrintTo(Image const& image, std::ostream* out);
+
+struct Releaser {
+    template <class T>
+    void operator()(T* object) const {
+        object->Release();
+    }
+};
+using TexturePtr = std::unique_ptr<ITextureObject>;
+using TargetPtr = std::unique_ptr<IRenderTarget, Releaser>;
+using DepthStencilPtr = std::unique_ptr<IDepthStencilBuffer, Releaser>;
+
+// A frame buffer as a host makes it, with raw GL, bound when made.
+class HostFrameBuffer {
+public:
+    HostFrameBuffer(int width, int height, GLenum format = GL_RGBA8);
+    ~HostFrameBuffer();
+    HostFrameBuffer(HostFrameBuffer const&) = delete;
+    HostFrameBuffer& operator=(HostFrameBuffer const&) = delete;
+
+    GLuint GetName() const { return mName; }
+    void Fill(Pixel color) const;
+    Image Read() const;
+
+private:
+    int const mWidth;
+    int const mHeight;
+    GLuint mName = 0;
+    GLuint mColor = 0;
+};
+
+class RendererFixture : public ::testing::Test {
+protected:
+    RendererFixture();
+    ~RendererFixture() override;
+    void SetUp() override;
+    void TearDown() override;
+
+    static bool Attach(RendererLimits const& limits = {});
+
+    static TexturePtr MakeTexture(int width, int height);
+    static TexturePtr MakeTexture(Image const& image);
+    static TexturePtr MakeView(ITextureObject const& model);
+    static TargetPtr MakeTarget(ITextureObject& texture);
+    static DepthStencilPtr MakeDepthStencil(int width, int height);
+
+    static Image Read(IRenderTarget& target, int width, int height);
+    static Image Read(ITextureObject& texture);
+    static void Clear(IRenderTarget& target, Pixel color);
+
+    // The error lines since the last call; one that nobody takes fails the test.
+    std::vector<std::string> TakeErrors();
+    // For tests that make the driver complain on purpose.
+    void ForgetDriverErrors();
+
+    EglContext& GetEgl() { return *mEgl; }
+    // Ends the context and begins another one.
+    void RestartEgl();
+
+private:
+    std::unique_ptr<EglContext> mEgl;
+    std::vector<std::string> mErrors;
+    std::uint64_t mKnownDriverErrors = 0;
+};
+
+// Draws a quad over the whole viewport with raw GL.
+class RawQuad {
+public:
+    // fragment: the body of main(), which writes "color"; "texel" is the sampler, "at" runs from (0, 0) to
+    // (1, 1).
+    explicit RawQuad(char const* fragment);
+    ~RawQuad();
+    RawQuad(RawQuad const&) = delete;
+    RawQuad& operator=(RawQuad const&) = delete;
+
+    void Draw() const;
+
+private:
+    GLuint mProgram = 0;
+    GLuint mVertices = 0;
+};
+
+GLint GetInteger(GLenum name);
+std::vector<GLint> GetViewport();
+
+} // namespace Moka::Testing

@@ -1,0 +1,162 @@
+// Copies within the GPU: of the render target into a texture, and of a texture into the render target.
+#include "tests/pixel/renderer/RendererFixture.h"
+
+namespace Moka::Testing {
+namespace {
+
+// Everything that could come between a texture and the frame buffer, set so that a draw would show nothing.
+void ObstructDrawing() {
+    glEnable(GL_SCISSOR_TEST);
+    glScissor(1, 1, 1, 1);
+    glEnable(GL_BLEND);
+    glBlendFunc(GL_ZERO, GL_ZERO);
+    glEnable(GL_STENCIL_TEST);
+    glStencilFunc(GL_NEVER, 0, 0xFF);
+    glColorMask(GL_FALSE, GL_FALSE, GL_FALSE, GL_FALSE);
+}
+
+void ExpectStillObstructed() {
+    EXPECT_TRUE(glIsEnabled(GL_SCISSOR_TEST));
+    EXPECT_TRUE(glIsEnabled(GL_BLEND));
+    EXPECT_TRUE(glIsEnabled(GL_STENCIL_TEST));
+    GLboolean mask[4];
+    glGetBooleanv(GL_COLOR_WRITEMASK, mask);
+    EXPECT_FALSE(mask[0] || mask[1] || mask[2] || mask[3]);
+}
+
+class TextureCopyTest : public RendererFixture, public ::testing::WithParamInterface<bool> {
+protected:
+    void SetUp() override {
+        RendererFixture::SetUp();
+        RendererFactory::SetDeferred(GetParam());
+    }
+};
+
+INSTANTIATE_TEST_SUITE_P(ImmediateAndDeferred, TextureCopyTest, ::testing::Bool(),
+                         [](auto const& mode) { return mode.param ? "Deferred" : "Immediate"; });
+
+TEST_P(TextureCopyTest, ACopyOfTheTargetHasTheSmallerOfBothSizesAndNoFlip) {
+    Image const image = Image::Pattern(7, 5);
+    TexturePtr const texture = MakeTexture(image);
+    TargetPtr const target = MakeTarget(*texture);
+    for (auto const& [width, height] : {std::pair{7, 5}, {4, 3}, {9, 8}, {4, 8}, {9, 2}}) {
+        TexturePtr const copy = MakeTexture(Image(width, height, kGreen));
+        target->Activate();
+        copy->CopyFromRenderTarget();
+        target->Deactivate(false, false);
+        int const w = std::min(width, 7);
+        int const h = std::min(height, 5);
+        EXPECT_EQ(Read(*copy), Image(width, height, kGreen).With(0, 0, image, 0, 0, w, h)) << width << height;
+    }
+}
+
+TEST_P(TextureCopyTest, ACopyOfTheTargetIgnoresTheStateAndKeepsTheBindings) {
+    Image const image = Image::Pattern(6, 6);
+    TexturePtr const texture = MakeTexture(image);
+    TexturePtr const bound = MakeTexture(2, 2);
+    TexturePtr const copy = MakeTexture(6, 6);
+    TargetPtr const target = MakeTarget(*texture);
+    ObstructDrawing();
+    RendererFactory::InvalidateState();
+    target->Activate();
+    bound->Bind(0);
+    glActiveTexture(GL_TEXTURE0);
+    GLint const frameBuffer = GetInteger(GL_DRAW_FRAMEBUFFER_BINDING);
+    GLint const name = GetInteger(GL_TEXTURE_BINDING_2D);
+    RendererFactory::InvalidateState();
+    copy->CopyFromRenderTarget();
+    EXPECT_EQ(GetInteger(GL_DRAW_FRAMEBUFFER_BINDING), frameBuffer);
+    EXPECT_EQ(GetInteger(GL_READ_FRAMEBUFFER_BINDING), frameBuffer);
+    EXPECT_EQ(GetInteger(GL_TEXTURE_BINDING_2D), name);
+    target->Deactivate(false, false);
+    ExpectStillObstructed();
+    EXPECT_EQ(Read(*copy), image);
+}
+
+TEST_P(TextureCopyTest, ATargetWithoutAlphaIsCopiedWithAlphaOne) {
+    HostFrameBuffer const host(5, 4, GL_RGB8);
+    host.Fill(Pixel{10, 20, 30, 40});
+    TargetPtr const target(RendererFactory::CreateRenderTargetFromCurrent(5, 4));
+    glEnable(GL_SCISSOR_TEST);
+    glScissor(0, 0, 1, 1);
+    RendererFactory::InvalidateState();
+    TexturePtr const copy = MakeTexture(Image(6, 6, kGreen));
+    target->Activate();
+    copy->CopyFromRenderTarget();
+    target->Deactivate(false, false);
+    EXPECT_TRUE(glIsEnabled(GL_SCISSOR_TEST));
+    Image const solid(5, 4, Pixel{10, 20, 30, 255});
+    EXPECT_EQ(Read(*copy), Image(6, 6, kGreen).With(0, 0, solid, 0, 0, 5, 4));
+}
+
+TEST_P(TextureCopyTest, WithoutAnActiveTargetTheHostsFrameBufferIsTheCurrentOne) {
+    HostFrameBuffer const host(4, 3);
+    RendererFactory::InvalidateState();
+    TexturePtr const texture = MakeTexture(Image::Pattern(4, 3));
+    TexturePtr const copy = MakeTexture(4, 3);
+    { // What was active last must not be taken for it.
+        TexturePtr const other = MakeTexture(4, 3);
+        TargetPtr const last = MakeTarget(*other);
+        last->Activate();
+        last->Deactivate(false, false);
+        texture->DrawToCurrent();
+        copy->CopyFromRenderTarget();
+    }
+    RendererFactory::Flush();
+    EXPECT_EQ(host.Read(), Image::Pattern(4, 3));
+    RendererFactory::InvalidateState();
+    EXPECT_EQ(Read(*copy), Image::Pattern(4, 3));
+}
+
+TEST_P(TextureCopyTest, ATextureDrawsItselfTexelForTexelThroughAnyState) {
+    Image const image = Image::Pattern(5, 4);
+    TexturePtr const source = MakeTexture(image);
+    TexturePtr const texture = MakeTexture(Image(7, 3, kGreen));
+    TargetPtr const target = MakeTarget(*texture);
+    DepthStencilPtr const buffer = MakeDepthStencil(7, 3);
+    target->AttachDepthStencil(buffer.get());
+    ObstructDrawing();
+    RendererFactory::InvalidateState();
+    target->Activate();
+    source->DrawToCurrent();
+    target->Deactivate(false, false);
+    RendererFactory::Flush();
+    ExpectStillObstructed();
+    EXPECT_EQ(Read(*texture), Image(7, 3, kGreen).With(0, 0, image, 0, 0, 5, 3));
+    EXPECT_EQ(Read(*source), image);
+}
+
+TEST_P(TextureCopyTest, ATextureDrawsItselfIntoTheLowerLeftOfTheDefaultFrameBuffer) {
+    if (!GetEgl().HasSurface()) GTEST_SKIP() << "this driver has no pbuffers";
+    constexpr int kWidth = EglContext::kSurfaceWidth;
+    constexpr int kHeight = EglContext::kSurfaceHeight;
+    TargetPtr const target(RendererFactory::CreateRenderTargetFromDefault(kWidth, kHeight));
+    Clear(*target, kBlue);
+    TexturePtr const source = MakeTexture(Image::Pattern(8, 8));
+    target->Activate();
+    source->DrawToCurrent();
+    TexturePtr const copy = MakeTexture(kWidth, kHeight);
+    copy->CopyFromRenderTarget();
+    target->Deactivate(false, false);
+    Image const expected = Image(kWidth, kHeight, kBlue).With(0, 0, Image::Pattern(8, 8), 0, 0, 8, 8);
+    EXPECT_EQ(Read(*target, kWidth, kHeight), expected);
+    EXPECT_EQ(Read(*copy), expected);
+}
+
+TEST_P(TextureCopyTest, ATextureOverTheActiveTargetsStorageCopiesNothing) {
+    Image const image = Image::Pattern(5, 4);
+    TexturePtr const texture = MakeTexture(image);
+    TexturePtr const view = MakeView(*texture);
+    TargetPtr const target = MakeTarget(*texture);
+    target->Activate();
+    for (ITextureObject* each : {texture.get(), view.get()}) {
+        each->DrawToCurrent();
+        each->CopyFromRenderTarget();
+    }
+    target->Deactivate(false, false);
+    EXPECT_EQ(RendererFactory::GetStatistics().copies, 0u);
+    EXPECT_EQ(Read(*texture), image);
+}
+
+} // namespace
+} // namespace Moka::Testing

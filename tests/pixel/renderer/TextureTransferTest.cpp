@@ -1,0 +1,205 @@
+// Pixels up to the GPU and back: which row goes where, what lies outside, and what the driver is told.
+#include "tests/pixel/renderer/RendererFixture.h"
+
+#include "moka/base/Rect.h"
+
+#include <cstring>
+#include <limits>
+
+namespace Moka::Testing {
+namespace {
+
+class TextureTransferTest : public RendererFixture {};
+
+// Pixel-store values that would ruin any transfer that trusts in the defaults.
+void LeavePixelStoreDirty(GLuint buffer) {
+    for (GLenum name : {GL_UNPACK_ROW_LENGTH, GL_UNPACK_SKIP_ROWS, GL_UNPACK_SKIP_PIXELS, GL_PACK_ROW_LENGTH,
+                        GL_PACK_SKIP_ROWS, GL_PACK_SKIP_PIXELS}) {
+        glPixelStorei(name, 3);
+    }
+    glPixelStorei(GL_UNPACK_ALIGNMENT, 1);
+    glPixelStorei(GL_PACK_ALIGNMENT, 8);
+    glBindBuffer(GL_PIXEL_UNPACK_BUFFER, buffer);
+    glBindBuffer(GL_PIXEL_PACK_BUFFER, buffer);
+}
+
+void ExpectDefaultPixelStore() {
+    for (GLenum name : {GL_UNPACK_ROW_LENGTH, GL_UNPACK_SKIP_ROWS, GL_UNPACK_SKIP_PIXELS, GL_PACK_ROW_LENGTH,
+                        GL_PACK_SKIP_ROWS, GL_PACK_SKIP_PIXELS, GL_PIXEL_UNPACK_BUFFER_BINDING,
+                        GL_PIXEL_PACK_BUFFER_BINDING}) {
+        EXPECT_EQ(GetInteger(name), 0) << std::hex << name;
+    }
+    EXPECT_EQ(GetInteger(GL_UNPACK_ALIGNMENT), 4);
+    EXPECT_EQ(GetInteger(GL_PACK_ALIGNMENT), 4);
+}
+
+TEST_F(TextureTransferTest, TheFirstRowUploadedIsGlRowZeroAndComesBackFirst) {
+    Image const image = Image::Pattern(5, 3);
+    TexturePtr const texture = MakeTexture(image);
+    EXPECT_EQ(Read(*texture), image);
+
+    // Seen by GL itself, without the renderer's own read-back.
+    TargetPtr const target = MakeTarget(*texture);
+    target->Activate();
+    Pixel first;
+    glReadPixels(1, 0, 1, 1, GL_RGBA, GL_UNSIGNED_BYTE, &first);
+    EXPECT_EQ(first, image.At(1, 0));
+}
+
+TEST_F(TextureTransferTest, ANewTextureWithoutPixelsIsTransparentWhateverForeignCodeLeft) {
+    glEnable(GL_SCISSOR_TEST);
+    glScissor(2, 2, 1, 1);
+    glColorMask(GL_FALSE, GL_TRUE, GL_FALSE, GL_TRUE);
+    // Freed memory is what a driver hands out again, so it is filled with something to be seen.
+    { TexturePtr const old = MakeTexture(Image(64, 64, kRed)); }
+    TexturePtr const texture = MakeTexture(64, 64);
+    EXPECT_EQ(Read(*texture), Image(64, 64, kClear));
+    EXPECT_TRUE(glIsEnabled(GL_SCISSOR_TEST));
+    GLboolean mask[4];
+    glGetBooleanv(GL_COLOR_WRITEMASK, mask);
+    EXPECT_FALSE(mask[0]);
+    EXPECT_TRUE(mask[1]);
+}
+
+TEST_F(TextureTransferTest, StripsAreUploadedOutOfALargerImage) {
+    Image const whole = Image::Pattern(300, 50);
+    for (Rect const& strip : {Rect(0, 0, 300, 16), Rect(0, 16, 300, 32), Rect(17, 32, 200, 50)}) {
+        int const width = strip.GetWidth();
+        int const height = strip.GetHeight();
+        TextureDescriptor const descriptor(width, height, 0, 2, 6, 1, true, nullptr);
+        PixelSource const source{whole.pixels.data(), strip.left, strip.top, whole.width};
+        TexturePtr const texture(RendererFactory::CreateTextureObject(descriptor, nullptr, 0, source));
+        EXPECT_EQ(Read(*texture),
+                  Image(width, height).With(0, 0, whole, strip.left, strip.top, width, height));
+    }
+    EXPECT_EQ(RendererFactory::GetStatistics().bytesUploaded, (300u * 32 + 183 * 18) * 4);
+}
+
+TEST_F(TextureTransferTest, UploadsOutsideTheTextureAreClippedAndTheRestLandsInItsPlace) {
+    Image const base = Image(8, 6, kGreen);
+    Image const source = Image::Pattern(5, 4);
+    struct {
+        int x, y;            // where the source is put
+        int left, top, w, h; // what of it must arrive
+    } const cases[] = {
+        {2, 1, 0, 0, 5, 4},  {-2, 1, 2, 0, 3, 4}, {2, -3, 0, 3, 5, 1}, {5, 4, 0, 0, 3, 2},
+        {-4, 5, 4, 0, 1, 1}, {8, 0, 0, 0, 0, 0},  {0, -4, 0, 0, 0, 0}, {-100, 100, 0, 0, 0, 0},
+    };
+    for (auto const& c : cases) {
+        TexturePtr const texture = MakeTexture(base);
+        texture->Replace(Rect(c.x, c.y, c.x + 5, c.y + 4), source.pixels.data(), 0);
+        EXPECT_EQ(Read(*texture), base.With(c.x + c.left, c.y + c.top, source, c.left, c.top, c.w, c.h))
+            << c.x << ' ' << c.y;
+    }
+}
+
+TEST_F(TextureTransferTest, EmptyInvertedAndHugeRectanglesDoNothingWrong) {
+    Image const base = Image(4, 4, kBlue);
+    TexturePtr const texture = MakeTexture(base);
+    std::vector<Pixel> const pixels(64, kRed);
+    constexpr int kMin = std::numeric_limits<int>::min();
+    constexpr int kMax = std::numeric_limits<int>::max();
+    for (Rect const& rect : {Rect(1, 1, 1, 3), Rect(3, 3, 1, 1), Rect(kMax, kMax, kMin, kMin),
+                             Rect(kMin, kMin, kMin + 4, kMin + 4), Rect(kMax - 4, 0, kMax, 4)}) {
+        texture->Replace(rect, pixels.data(), 0);
+    }
+    texture->Replace(nullptr, 0);
+    EXPECT_EQ(Read(*texture), base);
+    EXPECT_EQ(RendererFactory::GetStatistics().bytesUploaded, 64u);
+}
+
+TEST_F(TextureTransferTest, EveryStrideIsInBytes) {
+    Image const image = Image::Pattern(7, 5);
+    for (int stride : {28, 32, 29, 30, 43, 400}) {
+        auto const step = static_cast<std::size_t>(stride);
+        std::vector<unsigned char> memory(step * 5, 0xAB);
+        for (std::size_t y = 0; y < 5; ++y) std::memcpy(&memory[y * step], &image.pixels[y * 7], 28);
+        TexturePtr const texture = MakeTexture(7, 5);
+        texture->Replace(memory.data(), stride);
+        EXPECT_EQ(Read(*texture), image) << stride;
+
+        // Clipped at the left and at the top, where the source has to be advanced by rows of that stride.
+        TexturePtr const clipped = MakeTexture(Image(7, 5, kRed));
+        clipped->Replace(Rect(-2, -1, 5, 4), memory.data(), stride);
+        EXPECT_EQ(Read(*clipped), Image(7, 5, kRed).With(0, 0, image, 2, 1, 5, 4)) << stride;
+    }
+}
+
+TEST_F(TextureTransferTest, AStrideShorterThanARowIsRefusedWithALine) {
+    TexturePtr const texture = MakeTexture(Image(7, 5, kRed));
+    std::vector<Pixel> const pixels(35, kBlue);
+    texture->Replace(pixels.data(), 7);
+    EXPECT_EQ(Read(*texture), Image(7, 5, kRed));
+    std::vector<std::string> const errors = TakeErrors();
+    ASSERT_EQ(errors.size(), 1u);
+    EXPECT_NE(errors[0].find("28 bytes lie 7 bytes apart"), std::string::npos) << errors[0];
+}
+
+TEST_F(TextureTransferTest, ReadBackTouchesNothingButThePixelsInsideTheTarget) {
+    Image const image = Image::Pattern(8, 6);
+    TexturePtr const texture = MakeTexture(image);
+    TargetPtr const target = MakeTarget(*texture);
+    struct {
+        int x, y, w, h;               // the block asked for
+        int left, top, width, height; // what of it lies inside
+    } const cases[] = {
+        {0, 0, 8, 6, 0, 0, 8, 6}, {2, 1, 3, 4, 0, 0, 3, 4},    {-2, -1, 5, 3, 2, 1, 3, 2},
+        {6, 4, 5, 5, 0, 0, 2, 2}, {-1, -1, 10, 8, 1, 1, 8, 6}, {8, 0, 2, 2, 0, 0, 0, 0},
+        {0, 6, 2, 2, 0, 0, 0, 0}, {-5, 0, 5, 5, 0, 0, 0, 0},   {3, 3, 0, 2, 0, 0, 0, 0},
+    };
+    for (auto const& c : cases) {
+        // The block lies two rows down and three pixels in, in rows of fifteen.
+        Image destination(15, 14);
+        target->ReadPixels(c.x, c.y, c.w, c.h, {destination.pixels.data(), 15, 2, 3});
+        EXPECT_EQ(destination, Image(15, 14).With(3 + c.left, 2 + c.top, image, c.x + c.left, c.y + c.top,
+                                                  c.width, c.height))
+            << c.x << ' ' << c.y << ' ' << c.w << ' ' << c.h;
+    }
+}
+
+TEST_F(TextureTransferTest, ReadBackIntoRowsThatOverlapIsRefusedWithALine) {
+    TexturePtr const texture = MakeTexture(Image(4, 4, kRed));
+    TargetPtr const target = MakeTarget(*texture);
+    Image destination(4, 4);
+    target->ReadPixels(0, 0, 4, 4, {destination.pixels.data(), 3, 0, 0});
+    target->ReadPixels(0, 0, 1, 1, {destination.pixels.data(), 4, -1, 0});
+    EXPECT_EQ(destination, Image(4, 4));
+    EXPECT_EQ(TakeErrors().size(), 2u);
+    target->ReadPixels(0, 0, 4, 4, {nullptr, 4, 0, 0});
+}
+
+TEST_F(TextureTransferTest, PixelStoreLeaksNeitherInNorOut) {
+    GLuint buffer = 0;
+    glGenBuffers(1, &buffer);
+    glBindBuffer(GL_PIXEL_UNPACK_BUFFER, buffer);
+    glBufferData(GL_PIXEL_UNPACK_BUFFER, 4096, nullptr, GL_STREAM_DRAW);
+
+    LeavePixelStoreDirty(buffer);
+    Image const image = Image::Pattern(9, 7);
+    TexturePtr const texture = MakeTexture(image);
+    LeavePixelStoreDirty(buffer);
+    texture->Replace(Rect(1, 1, 4, 3), Image(3, 2, kRed).pixels.data(), 0);
+    LeavePixelStoreDirty(buffer);
+    Image const all = Read(*texture);
+    EXPECT_EQ(all, image.With(1, 1, Image(3, 2, kRed), 0, 0, 3, 2));
+
+    // Only the direction that was used is put back.
+    texture->Replace(all.pixels.data(), 0);
+    ExpectDefaultPixelStore();
+    glDeleteBuffers(1, &buffer);
+}
+
+TEST_F(TextureTransferTest, UploadsLeaveForeignTextureBindingsAlone) {
+    GLuint foreign = 0;
+    glGenTextures(1, &foreign);
+    glActiveTexture(GL_TEXTURE3);
+    glBindTexture(GL_TEXTURE_2D, foreign);
+    TexturePtr const texture = MakeTexture(Image::Pattern(4, 4));
+    texture->Replace(Image(4, 4, kRed).pixels.data(), 0);
+    EXPECT_EQ(GetInteger(GL_ACTIVE_TEXTURE), GL_TEXTURE3);
+    EXPECT_EQ(GetInteger(GL_TEXTURE_BINDING_2D), static_cast<GLint>(foreign));
+    glDeleteTextures(1, &foreign);
+}
+
+} // namespace
+} // namespace Moka::Testing

@@ -1,0 +1,93 @@
+#include "tests/support/ImageCompare.h"
+
+#include "moka/base/Bitmap.h"
+#include "moka/base/BitmapFactory.h"
+#include "moka/base/String.h"
+
+#include <algorithm>
+#include <cstdint>
+#include <cstdlib>
+#include <ostream>
+
+namespace Moka::Testing {
+namespace {
+
+int LargestDifference(unsigned char const* a, unsigned char const* b) {
+    int largest = 0;
+    for (int channel = 0; channel < 4; ++channel) {
+        largest = std::max(largest, std::abs(a[channel] - b[channel]));
+    }
+    return largest;
+}
+
+Color OnWhite(unsigned char const* pixel) {
+    auto const blend = [&](int channel) {
+        return static_cast<unsigned char>(std::min(255, pixel[channel] + 255 - pixel[3]));
+    };
+    return {blend(0), blend(1), blend(2), 255};
+}
+
+Color ShowDifference(unsigned char const* a, unsigned char const* b) {
+    int const difference = LargestDifference(a, b);
+    if (difference > 0) return {static_cast<unsigned char>(128 + difference / 2), 0, 0, 255};
+    Color const color = OnWhite(a);
+    auto const grey = static_cast<unsigned char>(160 + (color[0] + color[1] + color[2]) / 9);
+    return {grey, grey, grey, 255};
+}
+
+} // namespace
+
+std::ostream& operator<<(std::ostream& stream, ImageDifference const& difference) {
+    return stream << difference.differingPixels << " pixels differ, first at (" << difference.firstX << ", "
+                  << difference.firstY << "), by at most " << difference.largest << ", by " << difference.mean
+                  << " on average";
+}
+
+ImageDifference CompareImages(unsigned char const* a, unsigned char const* b, int width, int height) {
+    ImageDifference result;
+    std::int64_t sum = 0;
+    std::size_t offset = 0;
+    for (int y = 0; y < height; ++y) {
+        for (int x = 0; x < width; ++x, offset += 4) {
+            int const largest = LargestDifference(a + offset, b + offset);
+            if (largest == 0) continue;
+            if (result.differingPixels++ == 0) {
+                result.firstX = x;
+                result.firstY = y;
+            }
+            result.largest = std::max(result.largest, largest);
+            for (std::size_t i = offset; i < offset + 4; ++i) sum += std::abs(a[i] - b[i]);
+        }
+    }
+    if (offset > 0) result.mean = static_cast<double>(sum) / static_cast<double>(offset);
+    return result;
+}
+
+ImageDifference CompareImages(TestImage const& a, TestImage const& b) {
+    if (a.width == b.width && a.height == b.height) {
+        return CompareImages(a.pixels.data(), b.pixels.data(), a.width, a.height);
+    }
+    return {static_cast<int>(std::max(a.pixels.size(), b.pixels.size()) / 4), 255, 255, 0, 0};
+}
+
+bool WriteDifference(TestImage const& a, TestImage const& b, std::string const& path) {
+    int const width = std::min(a.width, b.width);
+    int const height = std::min(a.height, b.height);
+    TestImage sheet(width * 3, height);
+    for (int y = 0; y < height; ++y) {
+        for (int x = 0; x < width; ++x) {
+            sheet.SetColor(x, y, OnWhite(a.At(x, y)));
+            sheet.SetColor(x + width, y, ShowDifference(a.At(x, y), b.At(x, y)));
+            sheet.SetColor(x + 2 * width, y, OnWhite(b.At(x, y)));
+        }
+    }
+    Bitmap bitmap;
+    if (!bitmap.Construct(sheet.pixels.data(), sheet.width, sheet.height, sheet.GetStride(),
+                          Bitmap::kFormatRgba8888, false, false)) {
+        return false;
+    }
+    String const file(path);
+    return BitmapFactory::SaveBitmap(&bitmap, &file, 100);
+}
+
+} // namespace Moka::Testing

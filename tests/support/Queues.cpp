@@ -1,0 +1,117 @@
+#include "tests/support/Queues.h"
+
+#include <utility>
+
+namespace Moka::Testing {
+namespace {
+
+// The queue that is running a task on this thread.
+thread_local HandPumpedQueue const* tRunning = nullptr;
+
+class RunningScope {
+public:
+    RunningScope(HandPumpedQueue const* queue, std::function<void()> const& before,
+                 std::function<void()> const& after)
+        : mOuter(std::exchange(tRunning, queue)), mAfter(after) {
+        if (before) before();
+    }
+    ~RunningScope() {
+        if (mAfter) mAfter();
+        tRunning = mOuter;
+    }
+    RunningScope(RunningScope const&) = delete;
+    RunningScope& operator=(RunningScope const&) = delete;
+
+private:
+    HandPumpedQueue const* mOuter;
+    std::function<void()> const& mAfter;
+};
+
+} // namespace
+
+HandPumpedQueue::~HandPumpedQueue() = default;
+
+bool HandPumpedQueue::Post(ITask* task) {
+    std::lock_guard<std::mutex> lock(mMutex);
+    if (!task) {
+        ++mCounts.null;
+        return true;
+    }
+    if (!Accepts(++mCounts.offered, task)) {
+        ++mCounts.refused;
+        return false;
+    }
+    ++mCounts.posted;
+    mTasks.emplace_back(task);
+    return true;
+}
+
+bool HandPumpedQueue::Accepts(int, ITask*) { return true; }
+
+void HandPumpedQueue::WaitForTasks() {
+    bool const insideTask = tRunning == this;
+    {
+        std::lock_guard<std::mutex> lock(mMutex);
+        ++(insideTask ? mCounts.waitsInsideTask : mCounts.waits);
+    }
+    if (!insideTask) RunAll();
+}
+
+void HandPumpedQueue::SetAroundRun(std::function<void()> before, std::function<void()> after) {
+    mBeforeRun = std::move(before);
+    mAfterRun = std::move(after);
+}
+
+std::unique_ptr<ITask> HandPumpedQueue::TakeFirst() {
+    std::lock_guard<std::mutex> lock(mMutex);
+    if (mTasks.empty()) return nullptr;
+    std::unique_ptr<ITask> task = std::move(mTasks.front());
+    mTasks.pop_front();
+    ++mCounts.run;
+    return task;
+}
+
+bool HandPumpedQueue::RunOne() {
+    std::unique_ptr<ITask> task = TakeFirst();
+    if (!task) return false;
+    RunningScope scope(this, mBeforeRun, mAfterRun);
+    // Freed inside the scope: what the task owns dies on the render thread too.
+    std::unique_ptr<ITask> const running = std::move(task);
+    running->run();
+    return true;
+}
+
+int HandPumpedQueue::RunAll() {
+    int count = 0;
+    while (RunOne()) ++count;
+    return count;
+}
+
+int HandPumpedQueue::Count(int Counts::*counter) const {
+    std::lock_guard<std::mutex> lock(mMutex);
+    return mCounts.*counter;
+}
+
+int HandPumpedQueue::GetPendingCount() const {
+    std::lock_guard<std::mutex> lock(mMutex);
+    return static_cast<int>(mTasks.size());
+}
+
+int HandPumpedQueue::GetPostedCount() const { return Count(&Counts::posted); }
+int HandPumpedQueue::GetNullCount() const { return Count(&Counts::null); }
+int HandPumpedQueue::GetRunCount() const { return Count(&Counts::run); }
+int HandPumpedQueue::GetRefusedCount() const { return Count(&Counts::refused); }
+int HandPumpedQueue::GetWaitCount() const { return Count(&Counts::waits); }
+int HandPumpedQueue::GetWaitInsideTaskCount() const { return Count(&Counts::waitsInsideTask); }
+
+RefusingQueue::RefusingQueue() : RefusingQueue([](int, ITask*) { return true; }) {}
+
+RefusingQueue::RefusingQueue(std::set<int> ordinals)
+    : RefusingQueue(
+          [refused = std::move(ordinals)](int ordinal, ITask*) { return refused.count(ordinal) > 0; }) {}
+
+RefusingQueue::RefusingQueue(Predicate refuses) : mRefuses(std::move(refuses)) {}
+
+bool RefusingQueue::Accepts(int ordinal, ITask* task) { return !mRefuses(ordinal, task); }
+
+} // namespace Moka::Testing

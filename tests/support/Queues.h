@@ -1,0 +1,90 @@
+// Queues.h: queues for tests, which run tasks when the test says so, or refuse them.
+#pragma once
+
+#include "moka/graphics/task/IGLMsgQueue.h"
+#include "moka/graphics/task/ITask.h"
+
+#include <deque>
+#include <functional>
+#include <memory>
+#include <mutex>
+#include <set>
+
+namespace Moka::Testing {
+
+// HandPumpedQueue: only stores tasks, until a thread of the test's choice runs them.
+// Owner:  the test; tasks never run are freed with the queue.
+// Thread: any operation from any thread; one thread at a time runs tasks. No lock is held while one runs.
+// Fails:  an exception out of a task reaches the caller of Run...; the task is freed and counts as run.
+class HandPumpedQueue : public IGLMsgQueue {
+public:
+    HandPumpedQueue() = default;
+    ~HandPumpedQueue() override;
+    HandPumpedQueue(HandPumpedQueue const&) = delete;
+    HandPumpedQueue& operator=(HandPumpedQueue const&) = delete;
+
+    // Always true. A null task is counted and forgotten.
+    bool Post(ITask* task) override;
+
+    // Runs everything on the calling thread, which stands for both sides. Called from inside a task, it is
+    // the deadlock that a real queue would have: counted apart, and nothing runs.
+    void WaitForTasks() override;
+
+    // Calls around each run, so that a test can declare its thread the render thread meanwhile.
+    void SetAroundRun(std::function<void()> before, std::function<void()> after);
+
+    bool RunOne(); // false when nothing is stored
+    int RunAll();  // also what the tasks post; returns how many
+
+    int GetPendingCount() const;
+    int GetPostedCount() const;  // accepted tasks
+    int GetNullCount() const;    // null tasks
+    int GetRunCount() const;     // tasks run
+    int GetRefusedCount() const; // by a derived queue
+    int GetWaitCount() const;
+    int GetWaitInsideTaskCount() const;
+
+protected:
+    // Whether a task is accepted; ordinal counts the tasks offered, from 1. Called under the lock.
+    virtual bool Accepts(int ordinal, ITask* task);
+
+private:
+    struct Counts {
+        int offered = 0;
+        int posted = 0;
+        int null = 0;
+        int run = 0;
+        int refused = 0;
+        int waits = 0;
+        int waitsInsideTask = 0;
+    };
+
+    std::unique_ptr<ITask> TakeFirst();
+    int Count(int Counts::*counter) const;
+
+    std::mutex mutable mMutex;
+    std::deque<std::unique_ptr<ITask>> mTasks;
+    Counts mCounts;
+    std::function<void()> mBeforeRun;
+    std::function<void()> mAfterRun;
+};
+
+// RefusingQueue: refuses every task, or those that a test chooses; the others it stores like its base.
+class RefusingQueue final : public HandPumpedQueue {
+public:
+    using Predicate = std::function<bool(int ordinal, ITask* task)>;
+
+    RefusingQueue();
+    // Refuses the tasks with these ordinals, counted from 1 over all tasks offered, null ones excepted.
+    explicit RefusingQueue(std::set<int> ordinals);
+    // Refuses where the predicate says so. It is called under the queue's lock and must not use the queue.
+    explicit RefusingQueue(Predicate refuses);
+
+protected:
+    bool Accepts(int ordinal, ITask* task) override;
+
+private:
+    Predicate mRefuses;
+};
+
+} // namespace Moka::Testing

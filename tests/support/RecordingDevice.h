@@ -1,0 +1,133 @@
+// RecordingDevice: what the recording renderer knows, under one lock: its objects, images, calls and plans.
+// Every object belongs to the device until Reset(), also after its release.
+#pragma once
+
+#include "moka/base/NonAssignable.h"
+#include "moka/base/Rect.h"
+#include "moka/renderer/RendererStatistics.h"
+#include "tests/support/RecordingRenderer.h"
+
+#include <map>
+#include <memory>
+#include <mutex>
+#include <set>
+#include <sstream>
+#include <thread>
+#include <unordered_map>
+#include <vector>
+
+namespace Moka::Testing::detail {
+
+// What every device of the real renderer has at least.
+constexpr int kDefaultMaxTextureSize = 4096;
+
+// An image; textures made from a model and targets share one.
+struct Surface {
+    Surface(int w, int h);
+
+    unsigned char* At(int x, int y);
+    // Enlarges the image, keeping what it shows in the corner of its first row.
+    void Grow(int w, int h);
+
+    int width;
+    int height;
+    std::vector<unsigned char> pixels; // RGBA8, packed
+};
+
+struct ObjectState {
+    ObjectState(ObjectKind objectKind, int objectNumber, int objectContext)
+        : kind(objectKind), number(objectNumber), context(objectContext) {}
+    virtual ~ObjectState() = default;
+
+    std::string GetName() const;
+
+    ObjectKind const kind;
+    int const number;
+    int const context; // the attachment it was made in; the object is inert in any other
+    bool released = false;
+};
+
+struct TextureState;
+class RecordingTarget;
+
+struct Device : NonAssignable {
+    static Device& Get();
+
+    void Record(std::string const& object, char const* operation, std::string const& arguments);
+    void Violate(std::string const& text) { violations.push_back(text); }
+    // Notes a violation when this is not the render thread.
+    void CheckThread(std::string const& object, char const* operation);
+    // Whether the creation that is about to happen shall fail; counts it.
+    bool TakeFailure(ObjectKind kind);
+    int GetMaxTextureSize() const;
+    int CountLive(ObjectKind kind, bool anyContext) const;
+    RendererStatistics CountObjects() const;
+
+    template <class State, class... Arguments>
+    State* Add(Arguments&&... arguments) {
+        auto state = std::make_unique<State>(++lastNumber[State::kKind], context,
+                                             std::forward<Arguments>(arguments)...);
+        State* const pointer = state.get();
+        objects.push_back(std::move(state));
+        return pointer;
+    }
+
+    // Guards everything below. Recursive: releasing one object can touch another.
+    std::recursive_mutex mutable mutex;
+
+    bool attached = false;
+    int context = 0; // counts attachments
+    std::thread::id renderThread;
+    int deviceMaxTextureSize = kDefaultMaxTextureSize;
+    int limitedTextureSize = 0;
+    RendererStatistics counters; // the counters only; objects are counted when asked for
+
+    std::vector<RecordedCall> calls;
+    std::vector<std::string> violations;
+    int creations = 0;
+    std::set<int> failingCreations;
+    std::set<ObjectKind> failingKinds;
+    std::map<ObjectKind, int> lastNumber;
+
+    std::vector<std::unique_ptr<ObjectState>> objects;
+    std::unordered_map<void const*, TextureState*> texturesByAddress;
+
+    RecordingTarget* active = nullptr;
+    std::map<int, TextureState*> boundTextures;
+    std::shared_ptr<Surface> host; // the host's frame buffer
+};
+
+// One operation of an object: holds the lock, writes the call down and checks it.
+class Operation : NonAssignable {
+public:
+    Operation(ObjectState const& object, char const* name, std::string const& arguments = {});
+    // For getters: checked, not written down.
+    enum Quiet { kQuiet };
+    Operation(Quiet, ObjectState const& object, char const* name);
+    ~Operation() { mDevice.mutex.unlock(); }
+
+    // Whether the object can still do it: not released, and its context attached.
+    explicit operator bool() const { return mUsable; }
+    Device* operator->() const { return &mDevice; }
+
+private:
+    void Check(ObjectState const& object, char const* name);
+
+    Device& mDevice;
+    bool mUsable = false;
+};
+
+// The arguments of a call as text.
+template <class... Values>
+std::string Join(Values const&... values) {
+    std::ostringstream text;
+    char const* separator = "";
+    ((text << separator << values, separator = " "), ...);
+    return text.str();
+}
+std::string Join(Rect const& rect);
+
+// The part of a block that lies inside width x height; empty (all zero) when there is none.
+Rect ClipBlock(int x, int y, int blockWidth, int blockHeight, int width, int height);
+
+} // namespace Moka::Testing::detail

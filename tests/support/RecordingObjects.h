@@ -1,0 +1,109 @@
+// RecordingObjects.h: the renderer's objects as the recording renderer makes them.
+#pragma once
+
+#include "moka/renderer/IDepthStencilBuffer.h"
+#include "moka/renderer/IRenderTarget.h"
+#include "moka/renderer/ITextureObject.h"
+#include "moka/renderer/TextureDescriptor.h"
+#include "moka/renderer/TextureParameter.h"
+#include "tests/support/RecordingDevice.h"
+
+#include <cstddef>
+#include <new>
+
+namespace Moka::Testing::detail {
+
+// The part of a texture that the library deletes. Deleting it returns no memory: a released twin takes its
+// place there, so that a second deletion or a use finds somebody who complains.
+class RecordingTexture final : public ITextureObject {
+public:
+    explicit RecordingTexture(TextureState& state) : mState(state) {}
+    ~RecordingTexture() override;
+    static void operator delete(void* memory);
+
+    void SetLabel(char const* text) override;
+    char const* GetLabel() const override;
+    void Bind(int unit) override;
+    void Replace(void const* pixels, int stride) override;
+    void Replace(Rect const& rect, void const* pixels, int stride) override;
+    void DrawToCurrent() override;
+    void SetParameter(int id, int value) override;
+    void CopyFromRenderTarget() override;
+    int GetWidth() const override;
+    int GetHeight() const override;
+
+    TextureState& GetState() const { return mState; }
+
+private:
+    TextureState& mState;
+};
+
+struct TextureState final : ObjectState {
+    static constexpr ObjectKind kKind = ObjectKind::Texture;
+
+    TextureState(int textureNumber, int textureContext, std::shared_ptr<Surface> image);
+
+    // False, with a log line, for what names no parameter or no value of it.
+    bool SetParameter(int id, int value);
+    // Copies a block of pixels whose first one lies at (x, y), as far as it is inside the texture; stride in
+    // bytes. Returns the bytes copied.
+    std::size_t Upload(Rect const& rect, void const* pixels, std::size_t stride);
+
+    ITextureObject* GetObject() { return std::launder(reinterpret_cast<RecordingTexture*>(memory)); }
+
+    std::shared_ptr<Surface> surface;
+    std::string label;
+    std::map<int, int> parameters;
+    alignas(RecordingTexture) std::byte memory[sizeof(RecordingTexture)];
+};
+
+class RecordingBuffer final : public ObjectState, public IDepthStencilBuffer {
+public:
+    static constexpr ObjectKind kKind = ObjectKind::DepthStencilBuffer;
+
+    RecordingBuffer(int number_, int context_, int w, int h)
+        : ObjectState(kKind, number_, context_), width(w), height(h) {}
+
+    void Release() override;
+
+    int const width;
+    int const height;
+};
+
+class RecordingTarget final : public ObjectState, public IRenderTarget {
+public:
+    static constexpr ObjectKind kKind = ObjectKind::RenderTarget;
+
+    RecordingTarget(int number_, int context_, std::shared_ptr<Surface> surface, int w, int h, bool offscreen)
+        : ObjectState(kKind, number_, context_),
+          mSurface(std::move(surface)),
+          mWidth(w),
+          mHeight(h),
+          mOffscreen(offscreen) {}
+
+    void Activate() override;
+    void Deactivate(bool discardColor, bool discardDepthStencil) override;
+    void ReadPixels(int x, int y, int width, int height, PixelDestination const& destination) override;
+    void Release() override;
+    void ClearColor(float r, float g, float b, float a) override;
+    void AttachDepthStencil(IDepthStencilBuffer* buffer) override;
+    void DetachDepthStencil() override;
+    void ClearDepthStencil(bool clearDepth, float depth, bool clearStencil, int stencil) override;
+
+    bool IsOffscreen() const { return mOffscreen; }
+    Surface* GetSurface() const { return mSurface.get(); }
+    std::shared_ptr<Surface> const& ShareSurface() const { return mSurface; }
+    RecordingBuffer* GetAttached() const { return mAttached; }
+    void Forget(RecordingBuffer const* buffer) {
+        if (mAttached == buffer) mAttached = nullptr;
+    }
+
+private:
+    std::shared_ptr<Surface> mSurface;
+    int mWidth;
+    int mHeight;
+    bool mOffscreen;
+    RecordingBuffer* mAttached = nullptr;
+};
+
+} // namespace Moka::Testing::detail

@@ -1,0 +1,114 @@
+#include "tests/support/TestImages.h"
+
+#include <algorithm>
+#include <cmath>
+#include <cstring>
+
+namespace Moka::Testing {
+namespace {
+
+unsigned char ToByte(int value) { return static_cast<unsigned char>(value & 0xFF); }
+
+// A round pen pressed down at (cx, cy); darker ink stays.
+void PressPen(TestImage& page, double cx, double cy, double radius, Color const& ink) {
+    int const left = std::max(0, static_cast<int>(cx - radius - 1));
+    int const right = std::min(page.width - 1, static_cast<int>(cx + radius + 1));
+    int const top = std::max(0, static_cast<int>(cy - radius - 1));
+    int const bottom = std::min(page.height - 1, static_cast<int>(cy + radius + 1));
+    for (int y = top; y <= bottom; ++y) {
+        for (int x = left; x <= right; ++x) {
+            double const coverage =
+                std::clamp(radius + 0.5 - std::hypot(x + 0.5 - cx, y + 0.5 - cy), 0.0, 1.0);
+            int const alpha = static_cast<int>(std::lround(coverage * 255));
+            if (alpha <= page.At(x, y)[3]) continue;
+            auto const premultiply = [&](int channel) { return ToByte((channel * alpha + 127) / 255); };
+            page.SetColor(x, y,
+                          {premultiply(ink[0]), premultiply(ink[1]), premultiply(ink[2]), ToByte(alpha)});
+        }
+    }
+}
+
+// One line of joined-up writing from the left margin to the right one.
+void WriteLine(TestImage& page, double baseline, double height, int number) {
+    Color const ink = number % 5 == 4 ? Color{160, 20, 30, 255} : Color{20, 24, 60, 255};
+    double const margin = height;
+    for (double at = margin; at < page.width - margin; at += 0.5) {
+        double const t = at / height * 3.0 + number * 1.7;
+        bool const space = std::sin(t * 0.23 + number) > 0.85;
+        if (space) continue;
+        double const y = baseline - height * 0.3 * (std::sin(t * 2.1) + 0.5 * std::sin(t * 3.7 + number));
+        double const x = at + height * 0.25 * std::sin(t * 4.3);
+        PressPen(page, x, y, height * (0.05 + 0.02 * std::sin(t)), ink);
+    }
+}
+
+} // namespace
+
+TestImage::TestImage(int w, int h)
+    : width(w), height(h), pixels(static_cast<std::size_t>(w) * static_cast<std::size_t>(h) * 4) {}
+
+std::size_t TestImage::GetOffset(int x, int y) const {
+    return (static_cast<std::size_t>(y) * static_cast<std::size_t>(width) + static_cast<std::size_t>(x)) * 4;
+}
+
+Color TestImage::GetColor(int x, int y) const {
+    Color color;
+    std::memcpy(color.data(), At(x, y), 4);
+    return color;
+}
+
+void TestImage::SetColor(int x, int y, Color const& color) { std::memcpy(At(x, y), color.data(), 4); }
+
+TestImage TestImage::Crop(int x, int y, int w, int h) const {
+    TestImage part(w, h);
+    for (int row = 0; row < h && w > 0; ++row) {
+        std::memcpy(part.At(0, row), At(x, y + row), static_cast<std::size_t>(w) * 4);
+    }
+    return part;
+}
+
+Color GetGradientColor(int x, int y) {
+    return {ToByte(x), ToByte(y), ToByte(((x >> 8) & 0xF) << 4 | ((y >> 8) & 0xF)), 255};
+}
+
+TestImage MakeGradient(int width, int height) {
+    TestImage image(width, height);
+    for (int y = 0; y < height; ++y) {
+        for (int x = 0; x < width; ++x) image.SetColor(x, y, GetGradientColor(x, y));
+    }
+    return image;
+}
+
+TestImage MakeAlphaPattern(int width, int height) {
+    TestImage image(width, height);
+    for (int y = 0; y < height; ++y) {
+        for (int x = 0; x < width; ++x) {
+            int const alpha = (x + 16 * y) & 0xFF;
+            auto const part = [&](int channel) { return ToByte((channel & 0xFF) * alpha / 255); };
+            image.SetColor(x, y, {part(x * 7), part(y * 5), part(x * 3 + y * 11), ToByte(alpha)});
+        }
+    }
+    return image;
+}
+
+TestImage MakeChecker(int width, int height, int cell, Color const& first, Color const& second) {
+    TestImage image(width, height);
+    for (int y = 0; y < height; ++y) {
+        for (int x = 0; x < width; ++x) {
+            image.SetColor(x, y, (x / cell + y / cell) % 2 == 0 ? first : second);
+        }
+    }
+    return image;
+}
+
+TestImage MakeInkPage(int width, int height) {
+    TestImage page(width, height);
+    double const lineHeight = std::max(16.0, width / 24.0);
+    int number = 0;
+    for (double baseline = lineHeight * 1.5; baseline < height; baseline += lineHeight * 1.6) {
+        WriteLine(page, baseline, lineHeight, number++);
+    }
+    return page;
+}
+
+} // namespace Moka::Testing
