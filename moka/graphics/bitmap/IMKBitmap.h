@@ -1,0 +1,45 @@
+// IMKBitmap: a GPU image that canvases draw into and drawables sample from.
+// Owner:   reference counted; what a creating function returns carries one reference for its caller.
+// Thread:  caller-side bitmaps from any thread, render-thread bitmaps on the render thread only. The tag is
+//          not synchronised.
+// What a bitmap can do is asked through the four capability getters, which return null for what it lacks;
+// nobody casts.
+#pragma once
+
+#include "moka/graphics/bitmap/IMKBitmapDataGettable.h"
+
+namespace Moka {
+
+class IGLMsgQueue;
+class IMKBitmapCanvasAttachable;
+class IMKBitmapReadable;
+class IMKBitmapWritable;
+class IMKTextureBitmap;
+
+class IMKBitmap : public IMKBitmapDataGettable {
+public:
+    virtual int GetX() const = 0;
+    virtual int GetY() const = 0;
+    virtual int GetWidth() const = 0;
+    virtual int GetHeight() const = 0;
+    virtual Rect GetBitmapRect() = 0;
+
+    // A label for logs and GL debuggers; the first 126 bytes are kept, null is ignored.
+    virtual void SetTag(char const* tag) = 0;
+    virtual char const* GetTag() = 0;
+
+    // A caller-side bitmap over the same image, holding one reference; null when memory runs out.
+    virtual IMKBitmap* Clone() = 0;
+
+    virtual IGLMsgQueue* GetMsgQueue() = 0;
+
+    virtual int Ref() = 0;
+    virtual int Unref() = 0;
+
+    virtual IMKBitmapReadable* GetBitmapReadable() = 0;
+    virtual IMKBitmapWritable* GetBitmapWritable() = 0;
+    virtual IMKBitmapCanvasAttachable* GetBitmapCanvasAttachable() = 0;
+    virtual IMKTextureBitmap* GetTextureBitmap() = 0;
+};
+
+} // namespace Moka

@@ -1,0 +1,46 @@
+#include "moka/graphics/bitmap/ImageDecoding.h"
+
+#include "moka/base/BitmapFactory.h"
+#include "moka/base/String.h"
+#include "moka/base/log/AndroidLog.h"
+
+#include <atomic>
+
+namespace Moka {
+namespace {
+
+std::atomic<bool> useNativeDecoder{false};
+
+Bitmap* DecodeNatively(String const* path, int width, int height) {
+    if (width != 0 && height != 0) return BitmapFactory::CreateBitmap(path, width, height);
+    return BitmapFactory::CreateBitmapForGraphics(path);
+}
+
+} // namespace
+
+bool GetExtensionByFile(String const* path, String* extension) {
+    if (!path || !extension) return false;
+    String const source = *path; // extension may be path itself
+    extension->Clear();
+    return source.SubString(source.ReverseFind(".") + 1, extension);
+}
+
+bool CompareExtensionByFile(String const* path, char const* extension) {
+    String own;
+    return extension && GetExtensionByFile(path, &own) && own.CompareTo(extension) == 0;
+}
+
+void MKBitmapFactory_UseNativeDecoder() { useNativeDecoder = true; }
+
+Bitmap* CreateBitmapJNI(String const* path, int width, int height) {
+    if (useNativeDecoder) return DecodeNatively(path, width, height);
+    __android_log_print(ANDROID_LOG_ERROR, "mok_log", "MKBitmapFactory : gDecodeFile Not loaded");
+    return nullptr;
+}
+
+Bitmap* detail::DecodeFile(String const* path, int width, int height) {
+    if (CompareExtensionByFile(path, "mki")) return DecodeNatively(path, width, height);
+    return CreateBitmapJNI(path, width, height);
+}
+
+} // namespace Moka

@@ -1,0 +1,35 @@
+// MKFrameBuffer: the off-screen render target over one strip's texture.
+// Owner:  its strip. The reference count counts the canvases attached to the strip.
+// Thread: render thread only; callers elsewhere route its deletion there.
+// Fails:  without a render target (the renderer could not make it) every operation does nothing.
+#pragma once
+
+#include "moka/base/Export.h"
+#include "moka/base/RefCount.h"
+
+namespace Moka {
+
+class IRenderTarget;
+class ITextureObject;
+class MKDepthStencilBuffer;
+
+class MOKA_API MKFrameBuffer : public RefCount {
+public:
+    // The size is the texture's; width and height are not looked at.
+    MKFrameBuffer(int width, int height, ITextureObject* texture);
+    ~MKFrameBuffer() override;
+
+    void ActivateFrameBufferRT();
+    void DeactivateFrameBufferRT(bool discardColor, bool discardDepthStencil);
+    void AttachDepthStencilBufferRT(MKDepthStencilBuffer* buffer);
+    void DetachDepthStencilBufferRT();
+    void ClearColorRT(float r, float g, float b, float a);
+    void ClearDepthStencilRT(bool clearDepth, float depth, bool clearStencil, int stencil);
+
+    IRenderTarget* GetOffscreenRenderTarget() const { return mRenderTarget; }
+
+private:
+    IRenderTarget* mRenderTarget;
+};
+
+} // namespace Moka

@@ -1,0 +1,137 @@
+#include "moka/graphics/bitmap/MKGraphicsFactory.h"
+
+#include "moka/base/Bitmap.h"
+#include "moka/base/BitmapFactory.h"
+#include "moka/base/log/AndroidLog.h"
+#include "moka/graphics/bitmap/ImageDecoding.h"
+#include "moka/graphics/bitmap/MKSharedTextureBitmap.h"
+#include "moka/graphics/canvas/IMKCanvasBase.h"
+#include "moka/graphics/task/WorkerTask.h"
+
+#include <memory>
+#include <new>
+
+namespace Moka {
+namespace {
+
+bool IsValid(IGLMsgQueue* queue, int width, int height) {
+    if (queue && width >= 1 && height >= 1) return true;
+    __android_log_print(ANDROID_LOG_ERROR, "mok_log",
+                        "%s, bitmap is not created!, bitmap width = %d, height = %d, queue=%p",
+                        "CreateBitmap", width, height, static_cast<void*>(queue));
+    return false;
+}
+
+void LogInvalidParent(IMKBitmap* parent, char const* tag) {
+    __android_log_print(ANDROID_LOG_ERROR, "mok_log", "%s, invalid parent bitmap (%p:\"%s\")", "CreateBitmap",
+                        static_cast<void*>(parent), tag);
+}
+
+void LogUnavailable(char const* function, char const* what) {
+    __android_log_print(ANDROID_LOG_ERROR, "mok_log", "%s, %s are not part of this version of the library",
+                        function, what);
+}
+
+} // namespace
+
+IMKBitmap* MKGraphicsFactory::CreateBitmap(IGLMsgQueue* queue, int width, int height, void const* pixels,
+                                           bool deleteBuffer, int useQueue, bool textureFlag) {
+    if (!IsValid(queue, width, height)) return nullptr;
+    return new (std::nothrow)
+        MKTextureBitmap(queue, width, height, pixels, deleteBuffer, useQueue == 0, textureFlag);
+}
+
+IMKBitmap* MKGraphicsFactory::CreateBitmap(IGLMsgQueue* queue, Rect const& region, int width, int height,
+                                           void const* pixels, int useQueue) {
+    if (!IsValid(queue, width, height)) return nullptr;
+    Rect const clipped = region.Intersect(Rect(0, 0, width, height));
+    if (clipped.IsEmpty()) return nullptr;
+    // useQueue decides who owns the pixels here, and the strips are always caller-side; relied upon.
+    return new (std::nothrow) MKTextureBitmap(queue, clipped, width, height, pixels, useQueue == 0, false);
+}
+
+IMKBitmap* MKGraphicsFactory::CreateBitmap(IGLMsgQueue* queue, IMKBitmap* parent, int useQueue) {
+    if (!parent) {
+        LogInvalidParent(parent, "---");
+        return nullptr;
+    }
+    if (!parent->GetTextureBitmap()) {
+        LogInvalidParent(parent, parent->GetTag());
+        return nullptr;
+    }
+    return new (std::nothrow) MKSharedTextureBitmap(queue, parent, useQueue == 0);
+}
+
+IMKBitmap* MKGraphicsFactory::CreateBitmap(IGLMsgQueue* queue, String const* path, int useQueue) {
+    return CreateBitmap(queue, path, 0, 0, useQueue);
+}
+
+IMKBitmap* MKGraphicsFactory::CreateBitmap(IGLMsgQueue* queue, String const* path, int width, int height,
+                                           int useQueue) {
+    std::unique_ptr<Bitmap> const decoded(detail::DecodeFile(path, width, height));
+    if (!decoded) return nullptr;
+    // The buffer passes to the texture bitmap. A request refused below loses it; relied upon.
+    decoded->SetDeleteBuffer(false);
+    if (!IsValid(queue, decoded->GetWidth(), decoded->GetHeight())) return nullptr;
+    IMKBitmap* const bitmap = new (std::nothrow) MKTextureBitmap(
+        queue, decoded->GetWidth(), decoded->GetHeight(), decoded->GetBuffer(), true, useQueue == 0, false);
+    if (!bitmap) decoded->SetDeleteBuffer(true);
+    return bitmap;
+}
+
+IMKBitmap* MKGraphicsFactory::CreateBitmap(IGLMsgQueue* queue, Rect const& region, String const* path,
+                                           int useQueue) {
+    std::unique_ptr<Bitmap> const decoded(BitmapFactory::CreateBitmapForGraphics(path));
+    if (!decoded) return nullptr;
+    unsigned char const* const pixels = decoded->GetBuffer();
+    IMKBitmap* const bitmap =
+        CreateBitmap(queue, region, decoded->GetWidth(), decoded->GetHeight(), pixels, useQueue);
+    if (!bitmap) return nullptr;
+    // The uploads are still to run, so the array is freed behind them: by the bitmap when it owns the pixels,
+    // else from here.
+    decoded->SetDeleteBuffer(false);
+    if (useQueue != 0) WorkerTask::PostDeleteArray(queue, pixels);
+    return bitmap;
+}
+
+IMKBitmap* MKGraphicsFactory::CreateBitmap(IGLMsgQueue* queue, TextureObject const* texture, int useQueue) {
+    if (!texture) return nullptr;
+    return new (std::nothrow) MKTextureBitmap(queue, texture, useQueue == 0);
+}
+
+Bitmap* MKGraphicsFactory::CreateScaledCPUBitmap(String const* path, int width, int height) {
+    return detail::DecodeFile(path, width, height);
+}
+
+IMKBitmap* MKGraphicsFactory::CreateScreenBitmap(IGLMsgQueue*, int, int, int, int, int, int) {
+    LogUnavailable("CreateScreenBitmap", "screen bitmaps");
+    return nullptr;
+}
+
+void MKGraphicsFactory::RefBitmap(IMKBitmap* bitmap) {
+    if (bitmap) bitmap->Ref();
+}
+
+void MKGraphicsFactory::ReleaseBitmap(IMKBitmap* bitmap) {
+    if (bitmap) bitmap->Unref();
+}
+
+IMKCanvas* MKGraphicsFactory::CreateCanvas(IGLMsgQueue* queue, IMKBitmap* target, int) {
+    if (queue && target) LogUnavailable("CreateCanvas", "canvases");
+    return nullptr;
+}
+
+IMKPenCanvas* MKGraphicsFactory::CreatePenCanvas(IGLMsgQueue* queue, IMKBitmap* target, int) {
+    if (queue && target) LogUnavailable("CreatePenCanvas", "pen canvases");
+    return nullptr;
+}
+
+void MKGraphicsFactory::RefCanvas(IMKCanvasBase* canvas) {
+    if (canvas) canvas->Ref();
+}
+
+void MKGraphicsFactory::ReleaseCanvas(IMKCanvasBase* canvas) {
+    if (canvas) canvas->Unref();
+}
+
+} // namespace Moka

@@ -1,0 +1,183 @@
+#include "moka/graphics/bitmap/MKSubBitmap.h"
+
+#include "moka/graphics/bitmap/MKDepthStencilBuffer.h"
+#include "moka/graphics/bitmap/MKFrameBuffer.h"
+#include "moka/graphics/task/WorkerTask.h"
+#include "moka/renderer/ITextureObject.h"
+
+namespace Moka {
+
+template <class F, class... Values>
+void MKSubBitmap::PostSelf(F function, Values&&... values) {
+    Ref();
+    WorkerTask::PostMember(mMsgQueue, this, function, std::forward<Values>(values)...);
+}
+
+MKSubBitmap::MKSubBitmap(IGLMsgQueue* queue, int index, Rect const& rect, int width, int, void const* pixels,
+                         bool textureFlag)
+    : MKSubBitmapBase(queue, index, rect) {
+    PostSelf(&MKSubBitmap::createTextureRT, rect.left, rect.top, width, pixels, textureFlag);
+}
+
+MKSubBitmap::MKSubBitmap(IGLMsgQueue* queue, int index, Rect const& rect, IMKSubBitmap* model)
+    : MKSubBitmapBase(queue, index, rect) {
+    if (model) model->Ref();
+    PostSelf(&MKSubBitmap::createSharedTextureRT, model);
+}
+
+MKSubBitmap::~MKSubBitmap() {
+    // The render thread runs these in order: unhook, then delete what was hooked, then what it was hooked to.
+    if (MKFrameBuffer* const frameBuffer = mFrameBuffer) {
+        if (OwnsDepthStencil()) {
+            WorkerTask::PostMember(mMsgQueue, frameBuffer, &MKFrameBuffer::DetachDepthStencilBufferRT);
+            WorkerTask::PostDelete(mMsgQueue, mDepthStencil);
+        }
+        WorkerTask::PostDelete(mMsgQueue, frameBuffer);
+    }
+    WorkerTask::PostDelete(mMsgQueue, mTexture.load());
+}
+
+void MKSubBitmap::createTextureRT(int x, int y, int rowLength, void const* pixels, bool textureFlag) {
+    CreateTexture(x, y, rowLength, pixels, textureFlag);
+    Unref();
+}
+
+void MKSubBitmap::createSharedTextureRT(IMKSubBitmap* model) {
+    if (model) {
+        CreateTexture(model->GetTexture());
+        model->Unref();
+    }
+    Unref();
+}
+
+void MKSubBitmap::CreateFrameBuffer() { PostSelf(&MKSubBitmap::CreateFrameBufferRT, true); }
+
+void MKSubBitmap::ReleaseFrameBuffer() { PostSelf(&MKSubBitmap::ReleaseFrameBufferRT, true); }
+
+void MKSubBitmap::ActivateFrameBuffer() { PostSelf(&MKSubBitmap::ActivateFrameBufferRT, true); }
+
+void MKSubBitmap::DeactivateFrameBuffer(DiscardFramebufferType discard) {
+    PostSelf(&MKSubBitmap::DeactivateFrameBufferRT, true, discard);
+}
+
+void MKSubBitmap::AttachDepthBuffer() { PostSelf(&MKSubBitmap::attachDepthBufferRT); }
+
+void MKSubBitmap::attachDepthBufferRT() { AttachStencilBufferRT(true); }
+
+void MKSubBitmap::DetachDepthBuffer() { PostSelf(&MKSubBitmap::detachDepthBufferRT); }
+
+void MKSubBitmap::detachDepthBufferRT() { DetachStencilBufferRT(true); }
+
+void MKSubBitmap::SetTextureFilter(TextureParamFilteringValue value) {
+    using Function = void (MKSubBitmapBase::*)(TextureParamFilteringValue, bool);
+    PostSelf(static_cast<Function>(&MKSubBitmap::SetTextureFilterRT), value, true);
+}
+
+void MKSubBitmap::SetTextureFilter(TextureParamFiltering kind, TextureParamFilteringValue value) {
+    using Function = void (MKSubBitmapBase::*)(TextureParamFiltering, TextureParamFilteringValue, bool);
+    PostSelf(static_cast<Function>(&MKSubBitmap::SetTextureFilterRT), kind, value, true);
+}
+
+void MKSubBitmap::SetTextureWrap(TextureParamWrappingValue value) {
+    using Function = void (MKSubBitmapBase::*)(TextureParamWrappingValue, bool);
+    PostSelf(static_cast<Function>(&MKSubBitmap::SetTextureWrapRT), value, true);
+}
+
+void MKSubBitmap::SetTextureWrap(TextureParamWrapping kind, TextureParamWrappingValue value) {
+    using Function = void (MKSubBitmapBase::*)(TextureParamWrapping, TextureParamWrappingValue, bool);
+    PostSelf(static_cast<Function>(&MKSubBitmap::SetTextureWrapRT), kind, value, true);
+}
+
+void MKSubBitmap::UpdateBitmap(void const* pixels, int stride) {
+    PostSelf(&MKSubBitmap::updateBitmapRT, pixels, stride);
+}
+
+void MKSubBitmap::updateBitmapRT(void const* pixels, int stride) {
+    Upload(pixels, stride);
+    Unref();
+}
+
+void MKSubBitmap::UpdateBitmap(Rect const& r, void const* pixels, int stride) {
+    PostSelf(&MKSubBitmap::updateBitmapRectRT, r, pixels, stride);
+}
+
+void MKSubBitmap::updateBitmapRectRT(Rect const& r, void const* pixels, int stride) {
+    Upload(r, pixels, stride);
+    Unref();
+}
+
+unsigned int MKSubBitmap::GetPixel(Point const& p) {
+    unsigned int pixel = 0;
+    PostSelf(&MKSubBitmap::getPixelRT, p, &pixel, nullptr, nullptr);
+    mMsgQueue->WaitForTasks();
+    return pixel;
+}
+
+void MKSubBitmap::GetPixelAsync(Point const& p, void* userData, PixelCallback callback) {
+    PostSelf(&MKSubBitmap::getPixelRT, p, nullptr, userData, callback);
+}
+
+void MKSubBitmap::getPixelRT(Point const& p, unsigned int* result, void* userData, PixelCallback callback) {
+    unsigned int const pixel = ReadPixel(p);
+    if (result) *result = pixel;
+    if (callback) callback(pixel, userData);
+    Unref();
+}
+
+void MKSubBitmap::GetBitmapData(Rect const& r, void* destination) {
+    PostSelf(&MKSubBitmap::getBitmapDataRT, r, destination, nullptr, nullptr);
+    mMsgQueue->WaitForTasks();
+}
+
+void MKSubBitmap::GetBitmapDataAsync(Rect const& r, void* destination, void* userData,
+                                     DataCallback callback) {
+    PostSelf(&MKSubBitmap::getBitmapDataRT, r, destination, userData, callback);
+}
+
+void MKSubBitmap::getBitmapDataRT(Rect const& r, void* destination, void* userData, DataCallback callback) {
+    ReadBlock(r, destination);
+    if (callback) callback(r, destination, userData);
+    Unref();
+}
+
+void MKSubBitmap::SetTag(char const* tag) {
+    if (!tag) return;
+    {
+        std::lock_guard<std::mutex> lock(mTagLock);
+        mTag.Set(tag);
+    }
+    PostSelf(&MKSubBitmap::setTagRT, mTag.Get());
+}
+
+void MKSubBitmap::setTagRT(char const* tag) {
+    if (ITextureObject* const texture = mTexture) {
+        std::lock_guard<std::mutex> lock(mTagLock);
+        texture->SetLabel(tag);
+    }
+    Unref();
+}
+
+detail::BitmapTag MKSubBitmap::CopyTag() {
+    std::lock_guard<std::mutex> lock(mTagLock);
+    return mTag;
+}
+
+IMKSubBitmap* MKSubBitmap::Clone() {
+    auto* const clone =
+        new (std::nothrow) MKSubBitmap(mMsgQueue, mIndex, mRect, GetWidth(), GetHeight(), nullptr, false);
+    if (!clone) return nullptr;
+    clone->CreateFrameBuffer();
+    PostSelf(&MKSubBitmap::copyTextureRT, clone);
+    clone->SetTag(CopyTag().Get());
+    // Whether a canvas is attached to this strip decides whether the clone keeps its frame buffer: only when
+    // none is. It looks backwards; callers rely on it.
+    if (mFrameBuffer) clone->ReleaseFrameBuffer();
+    return clone;
+}
+
+void MKSubBitmap::copyTextureRT(MKSubBitmapBase* target) {
+    CopyTextureTo(target);
+    Unref();
+}
+
+} // namespace Moka

@@ -1,0 +1,47 @@
+// MKSubBitmapRT: a strip for code that already runs on the render thread: everything happens at once, nothing
+// is posted, no reference is taken. Callbacks run before the call returns.
+// Thread:  render thread only, its destruction included.
+#pragma once
+
+#include "moka/graphics/bitmap/MKSubBitmapBase.h"
+
+namespace Moka {
+
+class MOKA_API MKSubBitmapRT final : public MKSubBitmapBase {
+public:
+    // A texture over the strip's rows of pixels, an image `width` pixels wide; null for a transparent one.
+    MKSubBitmapRT(IGLMsgQueue* queue, int index, Rect const& rect, int width, int height, void const* pixels,
+                  bool textureFlag);
+
+    // A texture over model's storage; none when model is null.
+    MKSubBitmapRT(IGLMsgQueue* queue, int index, Rect const& rect, ITextureObject* model);
+
+    ~MKSubBitmapRT() override;
+
+    void CreateFrameBuffer() override { CreateFrameBufferRT(false); }
+    void ReleaseFrameBuffer() override { ReleaseFrameBufferRT(false); }
+    void ActivateFrameBuffer() override { ActivateFrameBufferRT(false); }
+    void DeactivateFrameBuffer(DiscardFramebufferType discard) override {
+        DeactivateFrameBufferRT(false, discard);
+    }
+    void AttachDepthBuffer() override { AttachStencilBufferRT(false); }
+    void DetachDepthBuffer() override { DetachStencilBufferRT(false); }
+    void SetTextureFilter(TextureParamFilteringValue value) override { SetTextureFilterRT(value, false); }
+    void SetTextureFilter(TextureParamFiltering kind, TextureParamFilteringValue value) override {
+        SetTextureFilterRT(kind, value, false);
+    }
+    void SetTextureWrap(TextureParamWrappingValue value) override { SetTextureWrapRT(value, false); }
+    void SetTextureWrap(TextureParamWrapping kind, TextureParamWrappingValue value) override {
+        SetTextureWrapRT(kind, value, false);
+    }
+    void UpdateBitmap(void const* pixels, int stride) override { Upload(pixels, stride); }
+    void UpdateBitmap(Rect const& r, void const* pixels, int stride) override { Upload(r, pixels, stride); }
+    unsigned int GetPixel(Point const& p) override { return ReadPixel(p); }
+    void GetPixelAsync(Point const& p, void* userData, PixelCallback callback) override;
+    void GetBitmapData(Rect const& r, void* destination) override { ReadBlock(r, destination); }
+    void GetBitmapDataAsync(Rect const& r, void* destination, void* userData, DataCallback callback) override;
+    void SetTag(char const* tag) override;
+    IMKSubBitmap* Clone() override;
+};
+
+} // namespace Moka

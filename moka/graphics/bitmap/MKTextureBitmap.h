@@ -1,0 +1,112 @@
+// MKTextureBitmap: an off-screen GPU image cut into horizontal strips no taller than the device allows. It
+// owns no GPU object itself: it keeps the strips and forwards to the first one, or to all of them.
+// Owner:   reference counted; the creator holds the first reference. Posted work holds the strips, not the
+//          bitmap.
+// Thread:  caller-side flavour from any thread (work is posted); render-thread flavour on the render thread
+//          only. The list of strips never changes after construction.
+// Units:   pixels, origin top left, y down; RGBA8, premultiplied.
+// Fails:   silently where the interface has no channel for it; sizes are validated by the factory.
+// Cost:    construction uploads once per strip; blocking reads wait for the render thread.
+// What reaches the first strip only (frame buffer, texture, stencil) is for whoever knows that there is but
+// one; canvases walk the strips.
+#pragma once
+
+#include "moka/base/List.h"
+#include "moka/graphics/bitmap/IMKBitmapCanvasAttachable.h"
+#include "moka/graphics/bitmap/IMKBitmapReadable.h"
+#include "moka/graphics/bitmap/IMKBitmapWritable.h"
+#include "moka/graphics/bitmap/IMKTextureBitmap.h"
+#include "moka/graphics/bitmap/MKBitmap.h"
+
+namespace Moka {
+
+class TextureObject;
+
+class MOKA_API MKTextureBitmap : public MKBitmap,
+                                 public IMKTextureBitmap,
+                                 public IMKBitmapWritable,
+                                 public IMKBitmapReadable,
+                                 public IMKBitmapCanvasAttachable {
+public:
+    // From tightly packed pixels (null for a transparent image). With deleteBuffer the bitmap frees them with
+    // array delete, once every strip has uploaded.
+    MKTextureBitmap(IGLMsgQueue* queue, int width, int height, void const* pixels, bool deleteBuffer,
+                    bool renderThread, bool textureFlag);
+
+    // Only what region covers of such an image; bands that miss it get no strip, but keep their number.
+    MKTextureBitmap(IGLMsgQueue* queue, Rect const& region, int width, int height, void const* pixels,
+                    bool deleteBuffer, bool renderThread);
+
+    // An empty bitmap of size zero; the texture and the switch are not looked at.
+    MKTextureBitmap(IGLMsgQueue* queue, TextureObject const* texture, bool renderThread);
+
+    // Over the textures of another bitmap's strips.
+    MKTextureBitmap(IGLMsgQueue* queue, IMKTextureBitmap* source, int width, int height, bool renderThread);
+
+    ~MKTextureBitmap() override;
+
+    unsigned int GetPixel(Point const& p) override;
+    void GetPixelAsync(Point const& p, void* userData, PixelCallback callback) override;
+    void GetBitmapData(Rect const& r, void* destination) override;
+    void GetBitmapDataAsync(Rect const& r, void* destination, void* userData, DataCallback callback) override;
+
+    void SetTag(char const* tag) override;
+    IMKBitmap* Clone() override;
+
+    IMKBitmapReadable* GetBitmapReadable() override { return this; }
+    IMKBitmapWritable* GetBitmapWritable() override { return this; }
+    IMKBitmapCanvasAttachable* GetBitmapCanvasAttachable() override { return this; }
+    IMKTextureBitmap* GetTextureBitmap() override { return this; }
+
+    IMKSubBitmap* GetSubBitmap(int index) override { return mSubBitmaps.GetAt(index); }
+    int GetSubBitmapCount() override { return mSubBitmaps.GetCount(); }
+    IMKBitmapBufferUpdatable* GetBitmapBufferUpdatable() override { return this; }
+
+    void AttachStencilBufferRT(bool release) override;
+    void DetachStencilBufferRT(bool release) override;
+    void AttachDepthBuffer() override;
+    void DetachDepthBuffer() override;
+    void UpdateBitmap(void const* pixels, int stride) override;
+    void UpdateBitmap(Rect const& r, void const* pixels, int stride) override;
+
+    Matrix4<float> GetProjectionMatrix() override;
+    void ActivateFrameBuffer() override;
+    void DeactivateFrameBuffer(DiscardFramebufferType discard) override;
+    void ActivateFrameBufferRT(bool release) override;
+    void DeactivateFrameBufferRT(bool release, DiscardFramebufferType discard) override;
+    void ClearColorRT(float r, float g, float b, float a) override;
+    void ClearDepthStencilRT(bool clearDepth, float depth, bool clearStencil, int stencil) override;
+
+    void ActivateTextureRT(int unit, bool release) override;
+    void SetTextureFilter(TextureParamFilteringValue value) override;
+    void SetTextureFilter(TextureParamFiltering kind, TextureParamFilteringValue value) override;
+    void SetTextureWrap(TextureParamWrappingValue value) override;
+    void SetTextureWrap(TextureParamWrapping kind, TextureParamWrappingValue value) override;
+    // These four ignore release and never drop a reference, unlike the other RT operations; relied upon.
+    void SetTextureFilterRT(TextureParamFilteringValue value, bool release) override;
+    void SetTextureFilterRT(TextureParamFiltering kind, TextureParamFilteringValue value,
+                            bool release) override;
+    void SetTextureWrapRT(TextureParamWrappingValue value, bool release) override;
+    void SetTextureWrapRT(TextureParamWrapping kind, TextureParamWrappingValue value, bool release) override;
+
+    void AttachToCanvas() override;
+    void DetachFromCanvas() override;
+    void AttachToCanvasRT(bool release) override;
+    void DetachFromCanvasRT(bool release) override;
+
+private:
+    void BuildStrips(Rect const& region, void const* pixels, bool renderThread, bool textureFlag);
+    void ShareStrip(int index, IMKSubBitmap* model, bool renderThread);
+    void FreePixels(void const* pixels, bool renderThread);
+
+    // A strip that memory ran out for is a null entry; every walk skips it.
+    template <class Action>
+    void ForEachStrip(Action const& action);
+    template <class Action>
+    void ForFirstStrip(Action const& action);
+    IMKSubBitmap* FindStrip(Point const& p);
+
+    List<IMKSubBitmap> mSubBitmaps; // top to bottom; each entry holds its strip's first reference
+};
+
+} // namespace Moka

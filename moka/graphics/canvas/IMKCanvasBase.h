@@ -1,0 +1,68 @@
+// IMKCanvasBase: what every canvas has: clearing, a matrix, clip rectangles, a save stack over both, a tag.
+// Owner:  reference counted; what a creating function returns carries one reference for its caller.
+// Thread: a caller-side canvas from one thread at a time, a render-thread canvas on the render thread.
+// Units:  pixels of the target, origin top left, y down; angles in degrees, positive turns +x towards +y.
+// The order of the operations is part of the contract.
+#pragma once
+
+#include "moka/graphics/math/Matrix3.h"
+
+namespace Moka {
+
+class IGLMsgQueue;
+class IMKBitmap;
+
+class IMKCanvasBase {
+public:
+    enum SaveFlag { SaveAll = 0, SaveMatrix = 1, SaveClip = 2 };
+
+    // How a clip rectangle R changes the allowed area A.
+    enum ClipOp {
+        Intersect = 0,         // A and R
+        Replace = 1,           // R
+        Union = 2,             // A or R
+        Xor = 3,               // either, not both
+        Difference = 4,        // A without R
+        ReverseDifference = 5, // R without A
+    };
+
+    virtual ~IMKCanvasBase() = default;
+
+    // Within the clip; a colour is 0xAARRGGBB or components 0 ... 1.
+    virtual void Clear(int argb) = 0;
+    virtual void Clear(float r, float g, float b, float a) = 0;
+    // The whole target.
+    virtual void ClearAll(int argb) = 0;
+    virtual void ClearAll(float r, float g, float b, float a) = 0;
+
+    // Returns the level to restore to; -1 restores the last one, a level that does not exist nothing.
+    virtual int Save(SaveFlag flag) = 0;
+    virtual void Restore(int level) = 0;
+
+    // In the coordinates of the current matrix.
+    virtual void SetClipRect(int x, int y, int width, int height, ClipOp op) = 0;
+
+    // Pre acts on points before the current matrix, post after it.
+    virtual void SetMatrix(Matrix3<float> const& matrix) = 0;
+    virtual Matrix3<float> GetMatrix() = 0;
+    virtual void PreConcat(Matrix3<float> const& matrix) = 0;
+    virtual void PostConcat(Matrix3<float> const& matrix) = 0;
+    virtual void PreScale(float sx, float sy) = 0;
+    virtual void PostScale(float sx, float sy) = 0;
+    virtual void PreRotate(float degrees) = 0;
+    virtual void PreRotate(float degrees, float px, float py) = 0;
+    virtual void PostRotate(float degrees) = 0;
+    virtual void PostRotate(float degrees, float px, float py) = 0;
+    virtual void PreTranslate(float tx, float ty) = 0;
+    virtual void PostTranslate(float tx, float ty) = 0;
+
+    virtual void SetTag(char const* tag) = 0;
+    virtual char const* GetTag() = 0;
+    virtual IGLMsgQueue* GetMsgQueue() = 0;
+    virtual IMKBitmap* GetBitmap() = 0;
+
+    virtual int Ref() = 0;
+    virtual int Unref() = 0;
+};
+
+} // namespace Moka

@@ -1,0 +1,150 @@
+// The factory: what it accepts, what it says when it does not, how it decodes.
+#include "moka/base/log/AndroidLog.h"
+#include "moka/graphics/bitmap/ImageDecoding.h"
+#include "moka/graphics/bitmap/MKBitmap.h"
+#include "tests/unit/bitmap/FactoryFixture.h"
+
+#include <fstream>
+#include <string>
+
+namespace Moka::Testing {
+namespace {
+
+TEST_F(Factory, AnInvalidRequestLogsOneLineAndGivesNothing) {
+    std::string const format = "%s, bitmap is not created!, bitmap width = %d, height = %d, queue=%p";
+    EXPECT_EQ(MKGraphicsFactory::CreateBitmap(&queue, 0, 7, nullptr, false, 1, false), nullptr);
+    EXPECT_EQ(MKGraphicsFactory::CreateBitmap(&queue, 7, -1, nullptr, false, 1, false), nullptr);
+    EXPECT_EQ(MKGraphicsFactory::CreateBitmap(nullptr, 7, 7, nullptr, false, 0, false), nullptr);
+    EXPECT_EQ(MKGraphicsFactory::CreateBitmap(&queue, Rect(0, 0, 1, 1), 0, 7, nullptr, 1), nullptr);
+    auto const lines = log.GetLines();
+    ASSERT_EQ(lines.size(), 4u);
+    for (LogLine const& line : lines) {
+        EXPECT_EQ(line.priority, ANDROID_LOG_ERROR);
+        EXPECT_EQ(line.tag, "mok_log");
+        EXPECT_EQ(line.format, format);
+    }
+    EXPECT_EQ(
+        lines[1].text.find("CreateBitmap, bitmap is not created!, bitmap width = 7, height = -1, queue="),
+        0u);
+}
+
+TEST_F(Factory, ARegionThatMissesTheImageIsSilentlyNothing) {
+    for (Rect const& region : {Rect(8, 0, 9, 9), Rect(0, -5, 4, 0), Rect(4, 4, 4, 4), Rect(5, 5, 2, 2)})
+        EXPECT_EQ(MKGraphicsFactory::CreateBitmap(&queue, region, 8, 8, nullptr, 1), nullptr);
+    EXPECT_TRUE(log.GetLines().empty());
+}
+
+// useQueue decides who owns the pixels of a region; its strips are caller-side in both cases.
+TEST_F(Factory, ARegionOwnsItsPixelsOnlyWithUseQueueZero) {
+    auto* const owned = new unsigned char[8 * 8 * 4]();
+    auto const owning =
+        BitmapPtr::Adopt(MKGraphicsFactory::CreateBitmap(&queue, Rect(0, 0, 8, 4), 8, 8, owned, 0));
+    EXPECT_EQ(queue.GetPendingCount(), 2) << "the upload and the deletion";
+    Pixels const kept(8 * 8 * 4);
+    auto const borrowing =
+        BitmapPtr::Adopt(MKGraphicsFactory::CreateBitmap(&queue, Rect(0, 0, 8, 4), 8, 8, kept.data(), 1));
+    EXPECT_EQ(queue.GetPendingCount(), 3);
+}
+
+struct Screen final : MKBitmap {
+    Screen() : MKBitmap(nullptr, 3, 4, 5, 6) { SetTag("screen"); }
+    unsigned int GetPixel(Point const&) override { return 0; }
+    void GetPixelAsync(Point const&, void*, PixelCallback) override {}
+    void GetBitmapData(Rect const&, void*) override {}
+    void GetBitmapDataAsync(Rect const&, void*, void*, DataCallback) override {}
+    IMKBitmap* Clone() override { return nullptr; }
+};
+
+TEST_F(Factory, AParentMustExistAndHaveTextures) {
+    EXPECT_EQ(MKGraphicsFactory::CreateBitmap(&queue, static_cast<IMKBitmap*>(nullptr), 1), nullptr);
+    auto const screen = BitmapPtr::Adopt(new Screen);
+    EXPECT_EQ(MKGraphicsFactory::CreateBitmap(&queue, screen.Get(), 1), nullptr);
+    auto const lines = log.GetLines();
+    ASSERT_EQ(lines.size(), 2u);
+    EXPECT_EQ(lines[0].format, "%s, invalid parent bitmap (%p:\"%s\")");
+    EXPECT_NE(lines[0].text.find(":\"---\")"), std::string::npos);
+    EXPECT_NE(lines[1].text.find(":\"screen\")"), std::string::npos);
+    EXPECT_EQ(CountOf(screen.Get()), 1);
+    EXPECT_EQ(screen->GetBitmapRect(), Rect(3, 4, 8, 10));
+}
+
+TEST_F(Factory, NullsAreIgnoredWhereTheyMayBe) {
+    MKGraphicsFactory::RefBitmap(nullptr);
+    MKGraphicsFactory::ReleaseBitmap(nullptr);
+    MKGraphicsFactory::RefCanvas(nullptr);
+    MKGraphicsFactory::ReleaseCanvas(nullptr);
+    EXPECT_EQ(MKGraphicsFactory::CreateBitmap(&queue, static_cast<TextureObject const*>(nullptr), 1),
+              nullptr);
+    EXPECT_EQ(MKGraphicsFactory::CreateCanvas(&queue, nullptr, 1), nullptr);
+    EXPECT_EQ(MKGraphicsFactory::CreatePenCanvas(nullptr, nullptr, 0), nullptr);
+    EXPECT_TRUE(log.GetLines().empty());
+    auto const bitmap = BitmapPtr::Adopt(Create(1, 1));
+    MKGraphicsFactory::RefBitmap(bitmap.Get());
+    EXPECT_EQ(CountOf(bitmap.Get()), 2);
+    MKGraphicsFactory::ReleaseBitmap(bitmap.Get());
+}
+
+TEST_F(Factory, TheExtensionIsWhatFollowsTheLastDot) {
+    String extension;
+    auto const of = [&](char const* path) {
+        String const p(path);
+        EXPECT_TRUE(GetExtensionByFile(&p, &extension));
+        return extension.ToUtf8();
+    };
+    EXPECT_EQ(of("a/b.c/photo.tar.mki"), "mki");
+    EXPECT_EQ(of("mki"), "mki") << "without a dot it is the whole path";
+    EXPECT_EQ(of("photo."), "");
+    EXPECT_EQ(of(""), "");
+    EXPECT_FALSE(GetExtensionByFile(nullptr, &extension));
+    String const upper("a.MKI");
+    EXPECT_FALSE(GetExtensionByFile(&upper, nullptr));
+    EXPECT_FALSE(CompareExtensionByFile(&upper, "mki"));
+    EXPECT_TRUE(CompareExtensionByFile(&upper, "MKI"));
+    EXPECT_FALSE(CompareExtensionByFile(nullptr, "mki"));
+}
+
+TEST_F(Factory, FilesOtherThanMkiNeedTheBridge) {
+    String const png = Save("a.png", 5, 4);
+    String const mki = Save("a.mki", 5, 4);
+    String const empty;
+    EXPECT_EQ(MKGraphicsFactory::CreateBitmap(&queue, &png, 1), nullptr);
+    EXPECT_EQ(MKGraphicsFactory::CreateBitmap(&queue, &empty, 1), nullptr);
+    EXPECT_EQ(MKGraphicsFactory::CreateScaledCPUBitmap(nullptr, 0, 0), nullptr);
+    EXPECT_EQ(log.GetTexts(ANDROID_LOG_ERROR),
+              std::vector<std::string>(3, "MKBitmapFactory : gDecodeFile Not loaded"));
+    log.Clear();
+    ExpectImage(BitmapPtr::Adopt(MKGraphicsFactory::CreateBitmap(&queue, &mki, 1)), UniquePixels(5, 4));
+    EXPECT_TRUE(log.GetLines().empty()) << "mki never reaches the bridge";
+}
+
+TEST_F(Factory, ARegionOfAFileIsDecodedWhateverItsExtensionAndOwnsItsPixelsUntilUploaded) {
+    int const h = kMaxSide + 10;
+    String const png = Save("tall.png", 6, h);
+    Pixels const whole = UniquePixels(6, h);
+    for (int useQueue : {0, 1}) {
+        queue.RunAll();
+        auto const bitmap = BitmapPtr::Adopt(
+            MKGraphicsFactory::CreateBitmap(&queue, Rect(0, kMaxSide - 3, 6, h), &png, useQueue));
+        EXPECT_EQ(queue.RunAll(), 3) << "two uploads and one deletion";
+        Pixels rows(6 * 13 * 4);
+        bitmap->GetBitmapData(Rect(0, kMaxSide - 3, 6, h), rows.data());
+        EXPECT_EQ(rows, Pixels(whole.end() - 6 * 13 * 4, whole.end()));
+    }
+    EXPECT_EQ(MKGraphicsFactory::CreateBitmap(&queue, Rect(9, 0, 12, 3), &png, 1), nullptr);
+    EXPECT_EQ(MKGraphicsFactory::CreateBitmap(nullptr, Rect(0, 0, 1, 1), &png, 1), nullptr);
+}
+
+TEST_F(Factory, ABrokenFileIsNothingAndSaysWhy) {
+    String const path = Path("broken.mki");
+    std::ofstream(path.ToUtf8()) << "MKI1 but no more";
+    String const missing = Path("missing.mki");
+    EXPECT_EQ(MKGraphicsFactory::CreateBitmap(&queue, &path, 1), nullptr);
+    EXPECT_EQ(MKGraphicsFactory::CreateBitmap(&queue, &missing, 1), nullptr);
+    EXPECT_EQ(MKGraphicsFactory::CreateBitmap(&queue, Rect(0, 0, 1, 1), &missing, 1), nullptr);
+    EXPECT_EQ(log.Count(ANDROID_LOG_ERROR, "broken.mki"), 1);
+    EXPECT_EQ(log.Count(ANDROID_LOG_ERROR, "missing.mki"), 2);
+    EXPECT_EQ(queue.GetPostedCount(), 0);
+}
+
+} // namespace
+} // namespace Moka::Testing

@@ -1,0 +1,29 @@
+// Decoding without Java. On its own, because a process does not go back to being without the native decoder.
+#include "moka/graphics/bitmap/ImageDecoding.h"
+#include "tests/unit/bitmap/FactoryFixture.h"
+
+#include <memory>
+
+namespace Moka::Testing {
+namespace {
+
+TEST_F(Factory, TheNativeDecoderOpensEveryFormat) {
+    MKBitmapFactory_UseNativeDecoder();
+    String const png = Save("b.png", 5, 4);
+    String const webp = Save("b.webp", 5, 4);
+    for (String const* path : {&png, &webp})
+        ExpectImage(BitmapPtr::Adopt(MKGraphicsFactory::CreateBitmap(&queue, path, 1)), UniquePixels(5, 4));
+    auto const scaled = BitmapPtr::Adopt(MKGraphicsFactory::CreateBitmap(&queue, &png, 3, 2, 1));
+    ASSERT_TRUE(scaled);
+    EXPECT_EQ(scaled->GetBitmapRect(), Rect(0, 0, 3, 2));
+    auto const unscaled = BitmapPtr::Adopt(MKGraphicsFactory::CreateBitmap(&queue, &png, 3, 0, 1));
+    EXPECT_EQ(unscaled->GetBitmapRect(), Rect(0, 0, 5, 4)) << "one size alone scales nothing";
+    std::unique_ptr<Bitmap> const cpu(MKGraphicsFactory::CreateScaledCPUBitmap(&png, 4, 4));
+    ASSERT_TRUE(cpu);
+    EXPECT_EQ(cpu->GetWidth(), 4);
+    OnRenderThread const here;
+    ExpectImage(BitmapPtr::Adopt(MKGraphicsFactory::CreateBitmap(&queue, &png, 0)), UniquePixels(5, 4));
+}
+
+} // namespace
+} // namespace Moka::Testing
