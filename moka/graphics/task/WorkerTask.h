@@ -27,7 +27,7 @@ public:
     void run() override { Call(std::index_sequence_for<Arguments...>()); }
 
 private:
-    // Instead of std::apply, for which one compiler warns of uninitialised memory under sanitizers.
+    // Not std::apply: GCC 12 with sanitizers hands it a lambda that it has not initialised.
     template <std::size_t... Index>
     void Call(std::index_sequence<Index...>) {
         (mObject->*mFunction)(std::get<Index>(mArguments)...);

@@ -43,7 +43,7 @@ TEST_F(Factory, ARegionOwnsItsPixelsOnlyWithUseQueueZero) {
     Pixels const kept(8 * 8 * 4);
     auto const borrowing =
         BitmapPtr::Adopt(MKGraphicsFactory::CreateBitmap(&queue, Rect(0, 0, 8, 4), 8, 8, kept.data(), 1));
-    EXPECT_EQ(queue.GetPendingCount(), 3);
+    EXPECT_EQ(queue.RunAll(), 3);
 }
 
 struct Screen final : MKBitmap {

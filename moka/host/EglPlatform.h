@@ -1,0 +1,23 @@
+// EglPlatform: the ways to an EGL display that need no window system, best first.
+#pragma once
+
+#include <EGL/egl.h>
+
+#include <string>
+#include <vector>
+
+namespace Moka::detail {
+
+struct EglPlatform {
+    std::string name;    // for a message: "device platform, device 1 of 2"
+    EGLDisplay display;  // not initialised by us; EGL_NO_DISPLAY when it could not be had
+    std::string failure; // why it could not be had
+};
+
+// Only what the EGL at hand offers. Never empty: the default display stands last.
+std::vector<EglPlatform> ListEglPlatforms();
+
+// Whether a list as eglQueryString gives it, which may be null, has a name.
+bool HasEglExtension(char const* extensions, char const* name);
+
+} // namespace Moka::detail

@@ -1,0 +1,38 @@
+// ShortLock: holds a mutex that nobody keeps for longer than a few instructions. It tries a while before it
+// sleeps: with many producers the sleeping and waking took three to four times as long as the posting.
+#pragma once
+
+#include <mutex>
+
+namespace Moka::detail {
+
+class ShortLock {
+public:
+    explicit ShortLock(std::mutex& mutex) : mMutex(mutex) {
+        for (int i = 0; i < kTries; ++i) {
+            if (mMutex.try_lock()) return;
+            for (int pause = 0; pause < kPauses; ++pause) Pause();
+        }
+        mMutex.lock();
+    }
+    ~ShortLock() { mMutex.unlock(); }
+    ShortLock(ShortLock const&) = delete;
+    ShortLock& operator=(ShortLock const&) = delete;
+
+private:
+    // Together some microseconds: longer than a holder needs, unless it has lost its core.
+    static constexpr int kTries = 64;
+    static constexpr int kPauses = 4;
+
+    static void Pause() {
+#if defined(__x86_64__)
+        __builtin_ia32_pause();
+#elif defined(__aarch64__)
+        __asm__ volatile("yield");
+#endif
+    }
+
+    std::mutex& mMutex;
+};
+
+} // namespace Moka::detail

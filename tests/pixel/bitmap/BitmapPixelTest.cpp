@@ -1,0 +1,208 @@
+// Bitmaps on a real driver: what goes up comes back, over strips, shared or not, and nothing stays behind.
+#include "moka/base/RefPtr.h"
+#include "moka/base/log/AndroidLog.h"
+#include "moka/graphics/bitmap/IMKBitmap.h"
+#include "moka/graphics/bitmap/IMKBitmapCanvasAttachable.h"
+#include "moka/graphics/bitmap/IMKBitmapWritable.h"
+#include "moka/graphics/bitmap/IMKSubBitmap.h"
+#include "moka/graphics/bitmap/IMKTextureBitmap.h"
+#include "moka/graphics/bitmap/MKGraphicsFactory.h"
+#include "moka/host/RenderThread.h"
+#include "moka/renderer/IRendererDeviceCaps.h"
+#include "moka/renderer/RendererFactory.h"
+#include "tests/support/ImageCompare.h"
+#include "tests/support/LogCapture.h"
+#include "tests/support/TestImages.h"
+
+#include <cstring>
+#include <gtest/gtest.h>
+#include <memory>
+#include <string>
+
+namespace Moka::Testing {
+namespace {
+
+using BitmapPtr = RefPtr<IMKBitmap>;
+constexpr int kMaxSide = 64;
+
+class PixelBitmap : public ::testing::Test {
+protected:
+    void SetUp() override {
+        RenderThreadOptions options;
+        options.limits.maxTextureSize = kMaxSide;
+        options.debugContext = true;
+        std::string error;
+        queue = RenderThread::Start(options, &error);
+        ASSERT_TRUE(queue) << error;
+    }
+
+    // Nothing alive on the GPU, and no driver message of error severity.
+    void TearDown() override {
+        queue->WaitForTasks();
+        RendererStatistics const s = RendererFactory::GetStatistics();
+        EXPECT_EQ(s.textures + s.frameBuffers + s.renderBuffers, 0);
+        EXPECT_EQ(s.textureObjects + s.renderTargets + s.depthStencilBuffers, 0);
+        EXPECT_EQ(s.errors, 0u);
+        queue.reset();
+        for (std::string const& line : log.GetTexts(ANDROID_LOG_ERROR)) ADD_FAILURE() << line;
+    }
+
+    BitmapPtr Create(TestImage const& image) {
+        return BitmapPtr::Adopt(MKGraphicsFactory::CreateBitmap(queue.get(), image.width, image.height,
+                                                                image.pixels.data(), false, 1, false));
+    }
+
+    static TestImage Read(BitmapPtr const& bitmap, Rect const& r) {
+        TestImage image(r.GetWidth(), r.GetHeight());
+        bitmap->GetBitmapData(r, image.pixels.data());
+        return image;
+    }
+    static TestImage Read(BitmapPtr const& bitmap) { return Read(bitmap, bitmap->GetBitmapRect()); }
+
+    static void ExpectSame(TestImage const& a, TestImage const& b) {
+        ImageDifference const difference = CompareImages(a, b);
+        EXPECT_EQ(difference.differingPixels, 0) << difference;
+    }
+
+    LogCapture log;
+    std::unique_ptr<RenderThread> queue;
+};
+
+TEST_F(PixelBitmap, RoundTripsEveryStripCountBitForBit) {
+    for (int height : {1, kMaxSide - 1, kMaxSide, kMaxSide + 1, 3 * kMaxSide, 3 * kMaxSide + 17})
+        for (int width : {1, 3, kMaxSide}) {
+            TestImage const image = MakeGradient(width, height);
+            auto const bitmap = Create(image);
+            EXPECT_EQ(bitmap->GetTextureBitmap()->GetSubBitmapCount(), (height + kMaxSide - 1) / kMaxSide);
+            ExpectSame(Read(bitmap), image);
+        }
+}
+
+TEST_F(PixelBitmap, KeepsEveryPremultipliedValue) {
+    TestImage const image = MakeAlphaPattern(kMaxSide, 5 * kMaxSide);
+    ExpectSame(Read(Create(image)), image);
+}
+
+TEST_F(PixelBitmap, ReadsBlocksOverStripEdgesAndPartlyOutside) {
+    TestImage const image = MakeGradient(40, 2 * kMaxSide + 20);
+    auto const bitmap = Create(image);
+    ExpectSame(Read(bitmap, Rect(3, kMaxSide - 5, 31, 2 * kMaxSide + 7)),
+               image.Crop(3, kMaxSide - 5, 28, kMaxSide + 12));
+    Rect const over(-2, 2 * kMaxSide, 44, 2 * kMaxSide + 30);
+    TestImage block(over.GetWidth(), over.GetHeight());
+    std::memset(block.pixels.data(), 0x5A, block.pixels.size());
+    bitmap->GetBitmapData(over, block.pixels.data());
+    for (int y = 0; y < block.height; ++y)
+        for (int x = 0; x < block.width; ++x) {
+            bool const inside = x >= 2 && x < 42 && y < 20;
+            Color const expected =
+                inside ? image.GetColor(x - 2, 2 * kMaxSide + y) : Color{0x5A, 0x5A, 0x5A, 0x5A};
+            ASSERT_EQ(block.GetColor(x, y), expected) << x << "," << y;
+        }
+}
+
+TEST_F(PixelBitmap, ReadsSinglePixels) {
+    TestImage const image = MakeGradient(20, 30);
+    auto const bitmap = Create(image);
+    for (Point const p : {Point(0, 0), Point(19, 0), Point(0, 29), Point(19, 29), Point(7, 11)}) {
+        unsigned int expected = 0;
+        std::memcpy(&expected, image.At(p.x, p.y), 4);
+        EXPECT_EQ(bitmap->GetPixel(p), expected);
+    }
+    EXPECT_EQ(bitmap->GetPixel(Point(20, 30)), 0u);
+}
+
+TEST_F(PixelBitmap, WithoutPixelsItIsTransparentAndUpdatesLandWhereTheyShould) {
+    auto const bitmap = BitmapPtr::Adopt(
+        MKGraphicsFactory::CreateBitmap(queue.get(), 32, kMaxSide + 8, nullptr, false, 1, false));
+    TestImage expected(32, kMaxSide + 8);
+    ExpectSame(Read(bitmap), expected);
+    TestImage const patch = MakeGradient(10, 6);
+    Rect const r(4, 20, 14, 26);
+    bitmap->GetTextureBitmap()->UpdateBitmap(r, patch.pixels.data(), patch.GetStride());
+    for (int y = 0; y < 6; ++y)
+        for (int x = 0; x < 10; ++x) expected.SetColor(4 + x, 20 + y, patch.GetColor(x, y));
+    ExpectSame(Read(bitmap), expected);
+}
+
+TEST_F(PixelBitmap, ACloneMadeAtOnceShowsTheImageWhoeverGoesFirst) {
+    TestImage const image = MakeGradient(33, 2 * kMaxSide + 3);
+    for (bool parentFirst : {true, false}) {
+        auto parent = Create(image);
+        auto clone = BitmapPtr::Adopt(parent->Clone());
+        (parentFirst ? parent : clone) = {};
+        ExpectSame(Read(parentFirst ? clone : parent), image);
+    }
+}
+
+TEST_F(PixelBitmap, AShareSeesUpdatesAndANewTextureIsNobodyElses) {
+    TestImage const image = MakeGradient(16, 16);
+    auto parent = Create(image);
+    auto const clone = BitmapPtr::Adopt(parent->Clone());
+    TestImage const other = MakeChecker(16, 16, 2, {255, 0, 0, 255}, {0, 0, 255, 255});
+    clone->GetTextureBitmap()->UpdateBitmap(other.pixels.data(), other.GetStride());
+    ExpectSame(Read(parent), other);
+    parent = {};
+    auto const fresh = Create(image); // a GL name deleted twice would now be this one's
+    ExpectSame(Read(clone), other);
+    ExpectSame(Read(fresh), image);
+}
+
+TEST_F(PixelBitmap, AStripsCloneIsACopy) {
+    TestImage const image = MakeGradient(16, 16);
+    auto const bitmap = Create(image);
+    IMKSubBitmap* const strip = bitmap->GetTextureBitmap()->GetSubBitmap(0);
+    strip->SetTag("strip");
+    auto const copy = RefPtr<IMKSubBitmap>::Adopt(strip->Clone());
+    TestImage const other = MakeChecker(16, 16, 2, {255, 0, 0, 255}, {0, 0, 255, 255});
+    bitmap->GetTextureBitmap()->UpdateBitmap(other.pixels.data(), other.GetStride());
+    TestImage read(16, 16);
+    copy->GetBitmapData(Rect(0, 0, 16, 16), read.pixels.data());
+    ExpectSame(read, image);
+}
+
+TEST_F(PixelBitmap, ClearsReachEveryStripThroughTheRenderSide) {
+    auto const bitmap = BitmapPtr::Adopt(
+        MKGraphicsFactory::CreateBitmap(queue.get(), 8, 2 * kMaxSide, nullptr, false, 1, false));
+    bitmap->GetBitmapCanvasAttachable()->AttachToCanvas();
+    ASSERT_TRUE(queue->Call([&] {
+        bitmap->GetBitmapWritable()->ActivateFrameBufferRT(false);
+        bitmap->GetTextureBitmap()->AttachStencilBufferRT(false);
+        bitmap->GetBitmapWritable()->ClearColorRT(0.2f, 0.4f, 0.6f, 0.8f);
+        bitmap->GetBitmapWritable()->ClearDepthStencilRT(true, 1, true, 3);
+        bitmap->GetTextureBitmap()->DetachStencilBufferRT(false);
+        bitmap->GetBitmapWritable()->DeactivateFrameBufferRT(false, DiscardFramebufferDepthStencil);
+    }));
+    bitmap->GetBitmapCanvasAttachable()->DetachFromCanvas();
+    TestImage const read = Read(bitmap);
+    EXPECT_EQ(read.GetColor(0, 0), (Color{51, 102, 153, 204}));
+    EXPECT_EQ(read.GetColor(7, 2 * kMaxSide - 1), (Color{51, 102, 153, 204}));
+}
+
+TEST_F(PixelBitmap, TheRenderThreadFlavourGivesTheSame) {
+    TestImage const image = MakeGradient(20, 2 * kMaxSide + 1);
+    TestImage direct(image.width, image.height);
+    TestImage shared(image.width, image.height);
+    ASSERT_TRUE(queue->Call([&] {
+        auto const bitmap = BitmapPtr::Adopt(MKGraphicsFactory::CreateBitmap(
+            queue.get(), image.width, image.height, image.pixels.data(), false, 0, false));
+        bitmap->GetBitmapData(bitmap->GetBitmapRect(), direct.pixels.data());
+        auto const share = BitmapPtr::Adopt(MKGraphicsFactory::CreateBitmap(queue.get(), bitmap.Get(), 0));
+        share->GetBitmapData(bitmap->GetBitmapRect(), shared.pixels.data());
+    }));
+    ExpectSame(direct, image);
+    ExpectSame(shared, image);
+}
+
+TEST_F(PixelBitmap, AWidthOverTheLimitIsReportedAndInert) {
+    auto const bitmap = Create(MakeGradient(kMaxSide + 1, 4));
+    TestImage block(4, 4);
+    std::memset(block.pixels.data(), 1, block.pixels.size());
+    bitmap->GetBitmapData(Rect(0, 0, 4, 4), block.pixels.data());
+    EXPECT_EQ(block.GetColor(0, 0), (Color{1, 1, 1, 1}));
+    EXPECT_EQ(log.Count(ANDROID_LOG_ERROR), 1);
+    log.Clear();
+}
+
+} // namespace
+} // namespace Moka::Testing

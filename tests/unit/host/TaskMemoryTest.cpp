@@ -1,0 +1,190 @@
+#include "moka/graphics/task/TaskMemory.h"
+
+#include "moka/graphics/task/ITask.h"
+
+#include <gtest/gtest.h>
+
+#include <array>
+#include <atomic>
+#include <cstdint>
+#include <cstring>
+#include <mutex>
+#include <new>
+#include <set>
+#include <stdexcept>
+#include <thread>
+#include <utility>
+#include <vector>
+
+namespace Moka::Testing {
+namespace {
+
+using detail::AllocateTask;
+using detail::FreeTask;
+
+constexpr std::size_t kSizes[] = {1, 16, 64, 65, 128, 129, 192, 193, 256, 257, 384, 385, 4096};
+
+// A block in use, filled with a value of its own that nobody else may change.
+struct Block {
+    unsigned char* memory = nullptr;
+    std::size_t size = 0;
+    unsigned char mark = 0;
+
+    static Block Make(std::size_t size, unsigned char mark) {
+        auto* const memory = static_cast<unsigned char*>(AllocateTask(size));
+        if (memory) std::memset(memory, mark, size);
+        return {memory, size, mark};
+    }
+    bool IsIntact() const {
+        for (std::size_t i = 0; i < size; ++i) {
+            if (memory[i] != mark) return false;
+        }
+        return true;
+    }
+    void Free() const { FreeTask(memory, size); }
+};
+
+TEST(TaskMemoryTest, GivesBlocksOfTheirOwnOnCacheLinesOfTheirOwn) {
+    std::vector<Block> blocks;
+    for (int i = 0; i < 100; ++i) {
+        for (std::size_t const size : kSizes) {
+            blocks.push_back(Block::Make(size, static_cast<unsigned char>(blocks.size())));
+            ASSERT_NE(blocks.back().memory, nullptr);
+            ASSERT_EQ(reinterpret_cast<std::uintptr_t>(blocks.back().memory) % detail::kTaskAlignment, 0u);
+        }
+    }
+    for (Block const& block : blocks) ASSERT_TRUE(block.IsIntact()) << block.size;
+    for (Block const& block : blocks) block.Free();
+    FreeTask(nullptr, 64);
+    FreeTask(nullptr);
+}
+
+TEST(TaskMemoryTest, BlocksFreedOnAnotherThreadAreIntactAndComeBackOnce) {
+    struct Channel {
+        std::mutex mutex;
+        std::vector<Block> blocks;
+    };
+    constexpr int kPairs = 3;
+    constexpr int kBlocks = 20000;
+    std::array<Channel, kPairs> channels;
+    std::atomic<int> broken{0};
+    std::vector<std::thread> threads;
+    for (int pair = 0; pair < kPairs; ++pair) {
+        Channel& channel = channels[static_cast<std::size_t>(pair)];
+        threads.emplace_back([&channel, pair] {
+            for (int i = 0; i < kBlocks; ++i) {
+                std::size_t const size = kSizes[static_cast<std::size_t>(i + pair) % std::size(kSizes)];
+                Block const block = Block::Make(size, static_cast<unsigned char>(i * kPairs + pair));
+                std::lock_guard<std::mutex> const lock(channel.mutex);
+                channel.blocks.push_back(block);
+            }
+        });
+        threads.emplace_back([&channel, &broken] {
+            for (int freed = 0; freed < kBlocks;) {
+                std::vector<Block> taken;
+                {
+                    std::lock_guard<std::mutex> const lock(channel.mutex);
+                    taken.swap(channel.blocks);
+                }
+                for (Block const& block : taken) {
+                    if (!block.IsIntact()) ++broken;
+                    block.Free();
+                }
+                freed += static_cast<int>(taken.size());
+                if (taken.empty()) std::this_thread::yield();
+            }
+        });
+    }
+    for (std::thread& thread : threads) thread.join();
+    EXPECT_EQ(broken, 0);
+}
+
+#if !defined(__SANITIZE_ADDRESS__)
+TEST(TaskMemoryTest, AThreadThatEndsLeavesItsBlocksToOthers) {
+    constexpr std::size_t kSize = 200;
+    std::set<void*> seen;
+    std::size_t largest = 0;
+    for (int round = 0; round < 100; ++round) {
+        std::thread([&] {
+            std::vector<void*> blocks;
+            for (int i = 0; i < 70; ++i) blocks.push_back(AllocateTask(kSize));
+            for (void* const block : blocks) FreeTask(block, kSize);
+            seen.insert(blocks.begin(), blocks.end());
+        }).join();
+        if (round == 0) largest = seen.size() + 2 * detail::kTaskBatch;
+    }
+    EXPECT_LE(seen.size(), largest);
+}
+
+TEST(TaskMemoryTest, AOneWayStreamReusesItsBlocks) {
+    constexpr std::size_t kSize = 100;
+    std::set<void*> seen;
+    for (int round = 0; round < 50; ++round) {
+        std::vector<void*> blocks;
+        for (int i = 0; i < 100; ++i) blocks.push_back(AllocateTask(kSize));
+        seen.insert(blocks.begin(), blocks.end());
+        std::thread([&blocks] {
+            for (void* const block : blocks) FreeTask(block, kSize);
+        }).join();
+    }
+    EXPECT_LE(seen.size(), 300u);
+}
+#endif
+
+// Uses the pool when its thread's own cache is gone already: what is built before it is destroyed after it.
+struct LateUser {
+    ~LateUser() {
+        if (!seen) return;
+        Block const first = Block::Make(300, 1);
+        Block const second = Block::Make(300, 2);
+        EXPECT_TRUE(first.memory && second.memory && first.IsIntact() && second.IsIntact());
+        seen->insert({first.memory, second.memory});
+        first.Free();
+        second.Free();
+    }
+    std::set<void*>* seen = nullptr;
+};
+thread_local LateUser tLateUser;
+
+TEST(TaskMemoryTest, AThreadThatIsBeingTornDownGetsBlocksAndGivesThemBack) {
+    std::set<void*> seen;
+    for (int round = 0; round < 100; ++round) {
+        std::thread([&seen] {
+            tLateUser.seen = &seen;
+            FreeTask(AllocateTask(300), 300);
+        }).join();
+    }
+    ASSERT_FALSE(seen.empty());
+#if !defined(__SANITIZE_ADDRESS__)
+    EXPECT_LE(seen.size(), 2u * detail::kTaskBatch);
+#endif
+}
+
+// Posted work may die with the statics of the process; a crash here fails the test program.
+struct StaticUser {
+    ~StaticUser() { Block::Make(100, 1).Free(); }
+} theStaticUser;
+
+template <std::size_t kBytes>
+struct ThrowingTask : ITask {
+    ThrowingTask() { throw std::runtime_error("no"); }
+    void run() override {}
+    std::array<char, kBytes> payload;
+};
+
+// The memory must come back, which the leak sanitizer sees, and the next one of that size gets it.
+TEST(TaskMemoryTest, ATaskWhoseConstructorThrowsGivesItsMemoryBack) {
+    EXPECT_THROW((void)new (std::nothrow) ThrowingTask<100>, std::runtime_error);
+    EXPECT_THROW((void)new (std::nothrow) ThrowingTask<1000>, std::runtime_error);
+#if !defined(__SANITIZE_ADDRESS__)
+    void* const before = AllocateTask(sizeof(ThrowingTask<100>));
+    FreeTask(before, sizeof(ThrowingTask<100>));
+    EXPECT_THROW((void)new (std::nothrow) ThrowingTask<100>, std::runtime_error);
+    void* const after = AllocateTask(sizeof(ThrowingTask<100>));
+    EXPECT_EQ(before, after);
+    FreeTask(after, sizeof(ThrowingTask<100>));
+#endif
+}
+
+} // namespace
+} // namespace Moka::Testing
