@@ -1,0 +1,13 @@
+// ConvertCommand: "moka convert": an image file into another format, through the GPU.
+#pragma once
+
+namespace CLI {
+class App;
+}
+
+namespace Moka::Tool {
+
+// The command runs inside app's parsing and throws Failure.
+void AddConvertCommand(CLI::App& app);
+
+} // namespace Moka::Tool

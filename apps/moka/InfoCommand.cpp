@@ -1,0 +1,80 @@
+#include "apps/moka/InfoCommand.h"
+
+#include "apps/moka/Arguments.h"
+#include "apps/moka/Failure.h"
+#include "apps/moka/LogCollector.h"
+#include "moka/base/BitmapFactory.h"
+#include "moka/base/String.h"
+#include "moka/host/RenderThread.h"
+
+#include <CLI/CLI.hpp>
+#include <memory>
+#include <string>
+#include <vector>
+
+namespace Moka::Tool {
+namespace {
+
+struct InfoOptions {
+    std::vector<std::string> files;
+    bool device = false;
+    bool verbose = false;
+};
+
+bool PrintFile(std::string const& file, LogCollector& log) {
+    String const path(file);
+    ImageInfo info;
+    if (!BitmapFactory::GetImageInfo(&path, &info)) {
+        PrintError(log.GetError());
+        log.Clear();
+        return false;
+    }
+    unsigned long long const decoded =
+        4ULL * static_cast<unsigned>(info.width) * static_cast<unsigned>(info.height);
+    std::printf("%s: %s, %dx%d, %s, %llu bytes, %llu decoded\n", file.c_str(),
+                BitmapFactory::GetFormatName(info.format), info.width, info.height,
+                info.hasAlpha ? "alpha" : "opaque", static_cast<unsigned long long>(info.fileBytes), decoded);
+    return true;
+}
+
+void PrintDevice() {
+    std::string error;
+    std::unique_ptr<RenderThread> const queue = RenderThread::Start({}, &error);
+    if (!queue) throw Failure(error);
+    RenderContextInfo const& info = queue->GetContextInfo();
+    std::printf("renderer         %s\n"
+                "vendor           %s\n"
+                "version          %s\n"
+                "EGL              %s\n"
+                "reached through  %s\n"
+                "largest texture  %d\n",
+                info.renderer.c_str(), info.vendor.c_str(), info.version.c_str(), info.eglVersion.c_str(),
+                info.path.c_str(), info.maxTextureSize);
+}
+
+// A broken file among many hides none of the others.
+void RunInfo(InfoOptions const& options) {
+    if (options.files.empty() && !options.device)
+        throw Failure(ExitStatus::Usage, "name a file, or ask for --device; see moka info --help");
+    LogCollector log(options.verbose);
+    bool isAllRead = true;
+    for (std::string const& file : options.files) isAllRead = PrintFile(file, log) && isAllRead;
+    if (options.device) PrintDevice();
+    if (!isAllRead) throw Failure("");
+}
+
+} // namespace
+
+void AddInfoCommand(CLI::App& app) {
+    auto const options = std::make_shared<InfoOptions>();
+    CLI::App* const command =
+        app.add_subcommand("info", "Tell what images are: format, size, alpha, bytes on disk, bytes decoded");
+    command->add_option("FILE", options->files, "The images to look at")
+        ->check(CLI::Validator(CheckPath, ""));
+    command->add_flag("--device", options->device,
+                      "Tell the GPU's driver, its largest texture and how it was reached");
+    command->add_flag("-v,--verbose", options->verbose, "Print the library's log to stderr");
+    command->callback([options] { RunInfo(*options); });
+}
+
+} // namespace Moka::Tool

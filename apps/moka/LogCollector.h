@@ -1,0 +1,40 @@
+// LogCollector: keeps the library's log off the terminal for its scope and turns its errors into a Failure.
+// The library reports a failure as a null and an error line, some as the line alone; so whoever used it asks
+// here whether there was one.
+// Thread:  lines from any thread; asked by any.
+#pragma once
+
+#include "moka/base/log/LogSink.h"
+
+#include <mutex>
+#include <string>
+
+namespace Moka::Tool {
+
+class LogCollector {
+public:
+    // With verbose every line is written to stderr as well.
+    explicit LogCollector(bool verbose);
+    ~LogCollector();
+    LogCollector(LogCollector const&) = delete;
+    LogCollector& operator=(LogCollector const&) = delete;
+
+    // The first error since Clear(), which is the cause where others follow from it; empty without one.
+    std::string GetError() const;
+    void Clear();
+
+    // Throws the first error, if there is one.
+    void ThrowError() const;
+    // Throws the first error, or fallback when nothing was logged.
+    [[noreturn]] void Throw(std::string const& fallback) const;
+
+private:
+    void OnLine(LogLine const& line);
+
+    bool const mVerbose;
+    std::mutex mutable mMutex;
+    std::string mError;
+    LogSink mPrevious;
+};
+
+} // namespace Moka::Tool

@@ -1,0 +1,145 @@
+#include "tests/app/ToolTest.h"
+
+#include <sys/stat.h>
+#include <unistd.h>
+
+namespace Moka::Testing {
+namespace {
+
+using ::testing::HasSubstr;
+using ::testing::StartsWith;
+
+constexpr int kFailed = 1;
+constexpr int kUsage = 2;
+
+class FailureTest : public ToolTest {
+protected:
+    FailureTest() {
+        Save(MakeAlphaPattern(90, 70), "in.png");
+        WriteFile("old.png", "what was there before");
+    }
+
+    // One line on stderr that holds every part, nothing on stdout, and the folder as it was.
+    void ExpectFails(std::vector<std::string> const& arguments, int status,
+                     std::vector<std::string> const& parts, ProcessOptions const& options = {}) const {
+        std::vector<std::string> const before = List();
+        ProcessResult const result = Run(arguments, options);
+        SCOPED_TRACE(::testing::PrintToString(arguments) + " said: " + result.err);
+        EXPECT_EQ(result.status, status);
+        EXPECT_EQ(result.CountErrorLines(), 1);
+        EXPECT_THAT(result.err, StartsWith("moka: "));
+        for (std::string const& part : parts) EXPECT_THAT(result.err, HasSubstr(part));
+        EXPECT_EQ(result.out, "");
+        EXPECT_EQ(List(), before);
+        EXPECT_EQ(ReadFile("old.png"), "what was there before");
+    }
+};
+
+TEST_F(FailureTest, WrongUsage) {
+    ExpectFails({}, kUsage, {"convert or info", "moka --help"});
+    ExpectFails({"paint"}, kUsage, {"command 'paint'", "moka --help"});
+    ExpectFails({"--paint"}, kUsage, {"option '--paint'", "moka --help"});
+    ExpectFails({"info"}, kUsage, {"--device", "moka info --help"});
+    ExpectFails({"info", "--divice"}, kUsage, {"--divice", "moka info --help"});
+    ExpectFails({"convert"}, kUsage, {"INPUT", "moka convert --help"});
+    ExpectFails({"convert", "in.png"}, kUsage, {"OUTPUT"});
+    ExpectFails({"convert", "in.png", "out.mki", "third"}, kUsage, {"third"});
+    ExpectFails({"convert", "in.png", "out.mki", "--qualify", "3"}, kUsage, {"--qualify"});
+    ExpectFails({"convert", "", "out.mki"}, kUsage, {"empty"});
+    ExpectFails({"convert", "in\xFF.png", "out.mki"}, kUsage, {"UTF-8"});
+}
+
+TEST_F(FailureTest, BadNumbers) {
+    for (char const* const quality : {"-1", "101", "high", ""})
+        ExpectFails({"convert", "in.png", "out.jpg", "--quality", quality}, kUsage, {"--quality", quality});
+    for (char const* const side : {"0", "-4", "65536", "9999999999", "1.5"})
+        ExpectFails({"convert", "in.png", "out.jpg", "--max-texture", side}, kUsage, {"--max-texture", side});
+    for (char const* const size : {"12", "0x5", "5x0", "5x", "x5", "5x5x5", "-5x5", "65536x1",
+                                   "99999999999x1", "40000x40000", "5 x 5", "axb"})
+        ExpectFails({"convert", "in.png", "out.jpg", "--size", size}, kUsage,
+                    {"--size", size, "WIDTHxHEIGHT"});
+}
+
+TEST_F(FailureTest, UnknownExtensions) {
+    for (char const* const name : {"out.bmp", "out", "png", "out.png.", "folder.png/out"})
+        ExpectFails({"convert", "in.png", name}, kUsage, {name, ".webp"});
+}
+
+TEST_F(FailureTest, InputsThatAreNoImage) {
+    WriteFile("text.png", "no picture at all, just words");
+    WriteFile("empty.webp", "");
+    std::filesystem::create_directory(mFolder / "folder.png");
+    ExpectFails({"convert", "missing.png", "old.png"}, kFailed, {"missing.png", "No such file"});
+    ExpectFails({"convert", "text.png", "old.png"}, kFailed, {"text.png", "PNG, JPEG, WebP"});
+    ExpectFails({"convert", "empty.webp", "old.png"}, kFailed, {"empty.webp", "empty"});
+    ExpectFails({"convert", "folder.png", "old.png"}, kFailed, {"folder.png", "folder"});
+    ExpectFails({"convert", "/dev/zero", "old.png"}, kFailed, {"/dev/zero", "regular file"});
+    ExpectFails({"convert", "two\nlines.png", "old.png"}, kFailed, {"lines.png"});
+}
+
+TEST_F(FailureTest, TruncatedInputs) {
+    for (std::string const name : {"cut.png", "cut.jpg", "cut.webp", "cut.mki"}) {
+        Save(MakeInkPage(90, 70), name);
+        Truncate(name);
+        ExpectFails({"convert", name, "old.png"}, kFailed, {name, "truncated"});
+    }
+}
+
+TEST_F(FailureTest, OutputsThatCannotBeWritten) {
+    std::filesystem::create_directory(mFolder / "folder.png");
+    ExpectFails({"convert", "in.png", "folder.png"}, kFailed, {"folder.png", "is a folder"});
+    ExpectFails({"convert", "in.png", "nowhere/out.png"}, kFailed, {"nowhere/out.png", "create it first"});
+    ExpectFails({"convert", "in.png", "old.png/out.png"}, kFailed, {"old.png/out.png", "no folder old.png"});
+    ExpectFails({"convert", "in.png", "/proc/moka.png"}, kFailed, {"/proc/moka.png"});
+    ASSERT_EQ(mkfifo(Path("pipe.png").c_str(), 0600), 0);
+    ExpectFails({"convert", "in.png", "pipe.png"}, kFailed, {"pipe.png", "regular file"});
+}
+
+TEST_F(FailureTest, AFolderWithoutPermission) {
+    if (geteuid() == 0) GTEST_SKIP() << "root may write everywhere";
+    std::filesystem::create_directory(mFolder / "locked");
+    chmod(Path("locked").c_str(), 0500);
+    ExpectFails({"convert", "in.png", "locked/out.png"}, kFailed, {"locked/out.png", "permission"});
+}
+
+TEST_F(FailureTest, AFullDisk) {
+    ProcessOptions options;
+    options.fileSizeLimit = 600;
+    for (std::string const output : {"out.png", "out.jpg", "out.webp", "out.mki", "old.png"})
+        ExpectFails({"convert", "in.png", output}, kFailed, {output, "File too large"}, options);
+}
+
+TEST_F(FailureTest, NoDriver) {
+    ProcessOptions options;
+    options.environment = {"__EGL_VENDOR_LIBRARY_DIRS=/nonexistent"};
+    ExpectFails({"convert", "in.png", "old.png"}, kFailed, {"Install"}, options);
+}
+
+TEST_F(FailureTest, WiderThanATexture) {
+    ExpectFails({"convert", "in.png", "old.png", "--max-texture", "64"}, kFailed,
+                {"in.png is 90 pixels wide", "up to 64", "--size 64x49"});
+    ExpectFails({"convert", "in.png", "old.png", "--max-texture", "64", "--size", "65x9"}, kFailed,
+                {"--size asks for 65 pixels", "up to 64"});
+    EXPECT_EQ(Run({"convert", "in.png", "out.png", "--max-texture", "64", "--size", "64x49"}).status, 0);
+}
+
+TEST_F(FailureTest, AFormatThatCannotHoldTheSize) {
+    Save(MakeGradient(1, 16400), "long.png");
+    ExpectFails({"convert", "long.png", "out.webp"}, kFailed, {"out.webp", "16383", "png"});
+}
+
+TEST_F(FailureTest, VerboseShowsTheLibrarysLog) {
+    ProcessResult const result = Run({"convert", "missing.png", "out.png", "--verbose"});
+    EXPECT_EQ(result.status, kFailed);
+    EXPECT_THAT(result.err, HasSubstr("error: cannot read image 'missing.png'"));
+    EXPECT_THAT(result.err, HasSubstr("moka: cannot read image 'missing.png'"));
+}
+
+TEST_F(FailureTest, OutputThatIsLost) {
+    ProcessOptions options;
+    options.out = "/dev/full";
+    ExpectFails({"info", "in.png"}, kFailed, {"standard output"}, options);
+}
+
+} // namespace
+} // namespace Moka::Testing

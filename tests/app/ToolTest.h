@@ -1,0 +1,41 @@
+// ToolTest.h: a folder for each test, pictures in it, and the tool at work there.
+#pragma once
+
+#include "moka/base/Bitmap.h"
+#include "tests/app/MokaProcess.h"
+#include "tests/support/TestImages.h"
+
+#include <filesystem>
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+#include <memory>
+#include <string>
+#include <vector>
+
+namespace Moka::Testing {
+
+class ToolTest : public ::testing::Test {
+protected:
+    ToolTest();
+    ~ToolTest() override;
+
+    // Names are relative to the test's folder throughout.
+    std::string Path(std::string const& name) const { return (mFolder / name).string(); }
+    void Save(TestImage const& image, std::string const& name, int quality = 100) const;
+    void WriteFile(std::string const& name, std::string const& content) const;
+    std::string ReadFile(std::string const& name) const;
+    // Cut off after half of its bytes.
+    void Truncate(std::string const& name) const;
+    // Empty when the file cannot be decoded.
+    TestImage Load(std::string const& name) const;
+    // Sorted; everything, hidden files as well.
+    std::vector<std::string> List() const;
+
+    ProcessResult Run(std::vector<std::string> const& arguments, ProcessOptions const& options = {}) const;
+    // Fails the test unless the tool succeeds without a word on stderr.
+    std::string RunWell(std::vector<std::string> const& arguments) const;
+
+    std::filesystem::path mFolder;
+};
+
+} // namespace Moka::Testing

@@ -1,0 +1,11 @@
+# Saves PICTURE through the README's program and through the tool; both must give the same file.
+set(written ${FOLDER}/written.mki)
+set(expected ${FOLDER}/expected.mki)
+file(REMOVE ${written} ${expected})
+execute_process(COMMAND ${README} ${PICTURE} ${written} COMMAND_ERROR_IS_FATAL ANY)
+execute_process(COMMAND ${MOKA} convert ${PICTURE} ${expected} COMMAND_ERROR_IS_FATAL ANY)
+file(SHA256 ${written} a)
+file(SHA256 ${expected} b)
+if(NOT a STREQUAL b)
+  message(FATAL_ERROR "${written} and ${expected} differ")
+endif()
