@@ -40,7 +40,7 @@ void operator delete[](void* block, std::size_t) noexcept { Free(block, arrayDel
 void operator delete(void* block, std::nothrow_t const&) noexcept { Free(block, plainDeletes); }
 void operator delete[](void* block, std::nothrow_t const&) noexcept { Free(block, arrayDeletes); }
 
-namespace Moka::test {
+namespace Moka::Testing {
 
 FailAllocations::FailAllocations() { ++failing; }
 FailAllocations::~FailAllocations() { --failing; }
@@ -56,4 +56,4 @@ int DeleteWatch::GetPlainDeletes() const { return plainDeletes; }
 
 int GetAllocationCount() { return allocations; }
 
-} // namespace Moka::test
+} // namespace Moka::Testing

@@ -1,8 +1,8 @@
-// allocation.h: lets a test see how a block is freed, and make allocations fail. The program that links
-// allocation.cpp allocates through it everywhere, in the libraries under test too.
+// Allocation.h: lets a test see how a block is freed, and make allocations fail. The program that links
+// Allocation.cpp allocates through it everywhere, in the libraries under test too.
 #pragma once
 
-namespace Moka::test {
+namespace Moka::Testing {
 
 // While one exists, every operator new of the thread that made it fails. Collect results in the scope and
 // assert after it, since assertions allocate.
@@ -29,4 +29,4 @@ public:
 // The operator new calls of the calling thread so far.
 int GetAllocationCount();
 
-} // namespace Moka::test
+} // namespace Moka::Testing

@@ -25,7 +25,7 @@ TEST(BitmapTest, FreesTheBufferWithArrayDeleteOnlyWhileTheSwitchIsOn) {
     };
     for (Case const& c : {Case{true, true, 1}, Case{true, false, 0}, Case{false, true, 1}}) {
         unsigned char* const pixels = NewPixels(2 * 3 * 4);
-        test::DeleteWatch const watch(pixels);
+        Testing::DeleteWatch const watch(pixels);
         {
             Bitmap bitmap;
             ASSERT_TRUE(bitmap.Construct(pixels, 2, 3, 8, 1, false, c.constructWith));
@@ -53,7 +53,7 @@ TEST(BitmapTest, CopyIsOwnedAndTightAndLeavesTheSourceToTheCaller) {
         EXPECT_EQ(std::vector<unsigned char>(copy, copy + 16),
                   (std::vector<unsigned char>{0, 1, 2, 3, 4, 5, 6, 7, 12, 13, 14, 15, 16, 17, 18, 19}));
     }
-    test::DeleteWatch const watch(pixels.get());
+    Testing::DeleteWatch const watch(pixels.get());
     {
         Bitmap bitmap;
         ASSERT_TRUE(bitmap.Construct(pixels.get(), 2, 2, 12, 1, true, true));
@@ -91,7 +91,7 @@ TEST(BitmapTest, ACopyThatCannotBeAllocatedIsRefused) {
     Bitmap bitmap;
     bool constructed = true;
     {
-        test::FailAllocations const fail;
+        Testing::FailAllocations const fail;
         constructed = bitmap.Construct(pixels.get(), 2, 2, 8, 1, true, false);
     }
     EXPECT_FALSE(constructed);

@@ -205,7 +205,7 @@ TEST_F(HandlerTest, WithoutMemoryMessagesAreRefused) {
     int sent = 0;
     std::optional<Handler> handler;
     {
-        test::FailAllocations const fail;
+        Testing::FailAllocations const fail;
         handler.emplace([](Handler*, void*, int) {}, nullptr);
         while (receiver->SendMessage(sent)) ++sent; // the queue has room for some
     }

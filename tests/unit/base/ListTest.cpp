@@ -63,14 +63,14 @@ TEST(ListTest, DrainsALongQueueFromEitherEndWithoutAllocating) {
     std::vector<int> objects(kCount);
     List<int> list;
     for (int& object : objects) ASSERT_TRUE(list.Add(&object));
-    int const before = test::GetAllocationCount();
+    int const before = Testing::GetAllocationCount();
     bool inOrder = true;
     for (int i = 0; i < kCount / 2; ++i) {
         inOrder = inOrder && list.RemoveAt(0) == &objects[static_cast<std::size_t>(i)];
         inOrder = inOrder &&
                   list.RemoveAt(list.GetCount() - 1) == &objects[static_cast<std::size_t>(kCount - 1 - i)];
     }
-    EXPECT_EQ(test::GetAllocationCount(), before);
+    EXPECT_EQ(Testing::GetAllocationCount(), before);
     EXPECT_TRUE(inOrder);
     EXPECT_TRUE(list.IsEmpty());
     EXPECT_EQ(list.RemoveAt(0), nullptr);
@@ -82,24 +82,24 @@ TEST(ListTest, AQueueInSteadyUseKeepsItsStorage) {
     for (int& object : objects) ASSERT_TRUE(list.Add(&object));
     int warm = 0;
     for (int round = 0; round < 1000; ++round) {
-        if (round == 100) warm = test::GetAllocationCount();
+        if (round == 100) warm = Testing::GetAllocationCount();
         for (int& object : objects) {
             ASSERT_TRUE(list.Add(&object));
             ASSERT_EQ(list.RemoveAt(0), &object);
         }
     }
-    EXPECT_EQ(test::GetAllocationCount(), warm);
+    EXPECT_EQ(Testing::GetAllocationCount(), warm);
 }
 
 TEST(ListTest, RefusesAnItemItHasNoMemoryForAndKeepsTheRest) {
     int first = 0;
     int second = 0;
-    int const before = test::GetAllocationCount();
+    int const before = Testing::GetAllocationCount();
     List<int> list;
-    EXPECT_EQ(test::GetAllocationCount(), before) << "an empty list allocates nothing";
+    EXPECT_EQ(Testing::GetAllocationCount(), before) << "an empty list allocates nothing";
     bool added = true;
     {
-        test::FailAllocations const fail;
+        Testing::FailAllocations const fail;
         added = list.Add(&first);
     }
     EXPECT_FALSE(added);
@@ -107,7 +107,7 @@ TEST(ListTest, RefusesAnItemItHasNoMemoryForAndKeepsTheRest) {
     ASSERT_TRUE(list.Add(&first));
     int accepted = 0;
     {
-        test::FailAllocations const fail;
+        Testing::FailAllocations const fail;
         while (list.Add(&second)) ++accepted; // until the storage it has is full
     }
     EXPECT_EQ(list.GetCount(), 1 + accepted);

@@ -1,5 +1,6 @@
 // Decoding without Java. On its own, because a process does not go back to being without the native decoder.
 #include "moka/graphics/bitmap/ImageDecoding.h"
+#include "tests/support/ArrayMemory.h"
 #include "tests/unit/bitmap/FactoryFixture.h"
 
 #include <memory>
@@ -23,6 +24,27 @@ TEST_F(Factory, TheNativeDecoderOpensEveryFormat) {
     EXPECT_EQ(cpu->GetWidth(), 4);
     OnRenderThread const here;
     ExpectImage(BitmapPtr::Adopt(MKGraphicsFactory::CreateBitmap(&queue, &png, 0)), UniquePixels(5, 4));
+}
+
+// One decoded copy from the file to the upload, and none after it.
+TEST_F(Factory, LoadingHoldsOneDecodedCopyUntilItIsUploaded) {
+    MKBitmapFactory_UseNativeDecoder();
+    constexpr int kWidth = 600;
+    constexpr int kHeight = 400;
+    constexpr std::size_t kBytes = std::size_t{kWidth} * kHeight * 4;
+    RecordingRenderer::SetMaxTextureSize(kWidth);
+    for (char const* name : {"m.mki", "m.png", "m.webp", "m.jpg"}) {
+        String const path = Save(name, kWidth, kHeight);
+        std::size_t const before = ArrayMemory::GetLive();
+        ArrayMemory::ResetPeak();
+        auto const bitmap = BitmapPtr::Adopt(MKGraphicsFactory::CreateBitmap(&queue, &path, 1));
+        ASSERT_TRUE(bitmap) << name;
+        EXPECT_LT(ArrayMemory::GetPeak() - before, kBytes + kBytes / 4) << name;
+        EXPECT_EQ(ArrayMemory::GetLive() - before, kBytes) << name;
+        queue.RunAll();
+        EXPECT_EQ(ArrayMemory::GetLive(), before) << name;
+        EXPECT_LT(ArrayMemory::GetPeak() - before, kBytes + kBytes / 4) << name;
+    }
 }
 
 } // namespace

@@ -5,54 +5,15 @@
 #include "moka/base/log/AndroidLog.h"
 
 #include <algorithm>
-#include <atomic>
 #include <cmath>
-#include <cstdlib>
 #include <filesystem>
 #include <fstream>
 #include <gtest/gtest.h>
 #include <iterator>
 #include <memory>
-#include <new>
 #include <random>
 
-namespace {
-
-std::atomic<std::size_t> liveBytes{0};
-std::atomic<std::size_t> peakBytes{0};
-constexpr std::size_t kPrefix = 16; // keeps the alignment
-
-void* AllocateCounted(std::size_t size) {
-    auto* const block = static_cast<unsigned char*>(std::malloc(size + kPrefix));
-    if (!block) return nullptr;
-    *reinterpret_cast<std::size_t*>(block) = size;
-    std::size_t const live = liveBytes += size;
-    std::size_t peak = peakBytes;
-    while (live > peak && !peakBytes.compare_exchange_weak(peak, live)) {
-    }
-    return block + kPrefix;
-}
-
-void FreeCounted(void* memory) {
-    if (!memory) return;
-    auto* const block = static_cast<unsigned char*>(memory) - kPrefix;
-    liveBytes -= *reinterpret_cast<std::size_t*>(block);
-    std::free(block);
-}
-
-} // namespace
-
-void* operator new[](std::size_t size) {
-    void* const memory = AllocateCounted(size);
-    if (!memory) throw std::bad_alloc();
-    return memory;
-}
-void* operator new[](std::size_t size, std::nothrow_t const&) noexcept { return AllocateCounted(size); }
-void operator delete[](void* memory) noexcept { FreeCounted(memory); }
-void operator delete[](void* memory, std::size_t) noexcept { FreeCounted(memory); }
-void operator delete[](void* memory, std::nothrow_t const&) noexcept { FreeCounted(memory); }
-
-namespace Moka::test {
+namespace Moka::Testing {
 namespace {
 
 Image MakeImage(int width, int height) {
@@ -170,10 +131,6 @@ std::vector<std::string> ErrorLines::Take() {
     return lines;
 }
 
-std::size_t ArrayMemory::GetLive() { return liveBytes; }
-std::size_t ArrayMemory::GetPeak() { return peakBytes; }
-void ArrayMemory::ResetPeak() { peakBytes = liveBytes.load(); }
-
 Image Decode(Bytes const& file, char const* name) {
     return FromBitmap(BitmapFactory::CreateBitmapFromMemory(file.data(), file.size(), name));
 }
@@ -219,4 +176,4 @@ std::size_t Find(Bytes const& bytes, Bytes const& what) {
     return static_cast<std::size_t>(found - bytes.begin());
 }
 
-} // namespace Moka::test
+} // namespace Moka::Testing

@@ -9,7 +9,7 @@
 #include <string>
 #include <vector>
 
-namespace Moka::test {
+namespace Moka::Testing {
 
 using Bytes = std::vector<unsigned char>;
 
@@ -71,14 +71,6 @@ private:
     LogSink mBefore;
 };
 
-// Bytes allocated by array new and not deleted, in the whole process: the pixel buffers and little else.
-class ArrayMemory {
-public:
-    static std::size_t GetLive();
-    static std::size_t GetPeak();
-    static void ResetPeak(); // to what is live
-};
-
 // Empty images when the factory returns null.
 Image Decode(Bytes const& file, char const* name = "test");
 Image DecodeFile(std::string const& path);
@@ -92,4 +84,4 @@ Bytes Replace(Bytes bytes, std::size_t at, Bytes const& with);
 Bytes Insert(Bytes bytes, std::size_t at, Bytes const& what);
 std::size_t Find(Bytes const& bytes, Bytes const& what); // fails the test when it is not there
 
-} // namespace Moka::test
+} // namespace Moka::Testing

@@ -5,7 +5,7 @@
 #include <gtest/gtest.h>
 #include <turbojpeg.h>
 
-namespace Moka::test {
+namespace Moka::Testing {
 namespace {
 
 using ::testing::ElementsAre;
@@ -120,4 +120,4 @@ TEST(JpegDecode, SubsamplingThatHasNoNameDecodes) {
 }
 
 } // namespace
-} // namespace Moka::test
+} // namespace Moka::Testing

@@ -1,5 +1,6 @@
 #include "moka/base/String.h"
 #include "moka/base/System.h"
+#include "tests/support/ArrayMemory.h"
 #include "tests/unit/codec/CodecTestSupport.h"
 
 #include <gmock/gmock.h>
@@ -9,7 +10,7 @@
 #include <utility>
 #include <zlib.h>
 
-namespace Moka::test {
+namespace Moka::Testing {
 namespace {
 
 using ::testing::AllOf;
@@ -200,4 +201,4 @@ TEST_F(Malformed, FoldersAreNamedInEngineeringBuildsOnly) {
 }
 
 } // namespace
-} // namespace Moka::test
+} // namespace Moka::Testing

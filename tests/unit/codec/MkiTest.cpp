@@ -5,7 +5,7 @@
 #include <zlib.h>
 #include <zstd.h>
 
-namespace Moka::test {
+namespace Moka::Testing {
 namespace {
 
 using ::testing::ElementsAre;
@@ -114,4 +114,4 @@ TEST(Mki, RefusesWhateverDoesNotAddUp) {
 }
 
 } // namespace
-} // namespace Moka::test
+} // namespace Moka::Testing

@@ -8,7 +8,7 @@
 #include <limits>
 #include <random>
 
-namespace Moka::test {
+namespace Moka::Testing {
 namespace {
 
 using detail::PixelSize;
@@ -141,4 +141,4 @@ TEST(RowScaler, ShrinksWithinTheMemoryOfItsSource) {
 }
 
 } // namespace
-} // namespace Moka::test
+} // namespace Moka::Testing

@@ -8,7 +8,7 @@
 #include <png.h>
 #include <random>
 
-namespace Moka::test {
+namespace Moka::Testing {
 namespace {
 
 struct PngKind {
@@ -221,4 +221,4 @@ TEST(PngDecode, ATransparentColourCountsAsAlpha) {
 }
 
 } // namespace
-} // namespace Moka::test
+} // namespace Moka::Testing

@@ -1,11 +1,12 @@
 #include "moka/base/Bitmap.h"
 #include "moka/base/String.h"
+#include "tests/support/ArrayMemory.h"
 #include "tests/unit/codec/CodecTestSupport.h"
 
 #include <algorithm>
 #include <gtest/gtest.h>
 
-namespace Moka::test {
+namespace Moka::Testing {
 namespace {
 
 TEST(RoundTrip, LosslessFormatsKeepEveryPremultipliedPixel) {
@@ -142,4 +143,4 @@ TEST(RoundTrip, DecodingHoldsOneCopyOfThePixels) {
 }
 
 } // namespace
-} // namespace Moka::test
+} // namespace Moka::Testing

@@ -11,7 +11,7 @@
 #include <sys/stat.h>
 #include <unistd.h>
 
-namespace Moka::test {
+namespace Moka::Testing {
 namespace {
 
 using ::testing::AllOf;
@@ -183,4 +183,4 @@ TEST(Save, APathWithoutAFolderMeansTheCurrentOne) {
 }
 
 } // namespace
-} // namespace Moka::test
+} // namespace Moka::Testing

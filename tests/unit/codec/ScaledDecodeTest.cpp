@@ -4,7 +4,7 @@
 #include <gtest/gtest.h>
 #include <utility>
 
-namespace Moka::test {
+namespace Moka::Testing {
 namespace {
 
 Image Scale(Image const& source, int width, int height) {
@@ -80,4 +80,4 @@ TEST(ScaledDecode, RefusesSizesOutsideTheLimits) {
 }
 
 } // namespace
-} // namespace Moka::test
+} // namespace Moka::Testing

@@ -1,0 +1,17 @@
+// ArrayMemory: bytes allocated by array new and not deleted, in the whole process: pixel buffers and little else.
+// Linking it replaces array new and delete, so it is a library of its own, for the tests that ask.
+// Thread: any.
+#pragma once
+
+#include <cstddef>
+
+namespace Moka::Testing {
+
+class ArrayMemory {
+public:
+    static std::size_t GetLive();
+    static std::size_t GetPeak();
+    static void ResetPeak(); // to what is live
+};
+
+} // namespace Moka::Testing
