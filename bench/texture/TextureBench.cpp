@@ -2,10 +2,10 @@
 // whatever else the machine does hits both alike. The counter to read is "ratio": the renderer's time over
 // bare GL's, the median of all pairs. Each transfer ends with glFinish, because drivers put uploads off.
 #include "moka/base/Rect.h"
+#include "moka/host/EglContext.h"
 #include "moka/renderer/IRenderTarget.h"
 #include "moka/renderer/ITextureObject.h"
 #include "moka/renderer/RendererFactory.h"
-#include "tests/support/EglContext.h"
 
 #include <GLES3/gl3.h>
 #include <benchmark/benchmark.h>
@@ -34,9 +34,9 @@ std::uint32_t* RowOf(int y) { return GetPixels().data() + static_cast<std::ptrdi
 
 // Once for all benchmarks; the process's end takes it down.
 void AttachOnce() {
-    static std::unique_ptr<Testing::EglContext> const egl = [] {
+    static std::unique_ptr<detail::EglContext> const egl = [] {
         std::string error;
-        std::unique_ptr<Testing::EglContext> context = Testing::EglContext::Create(false, &error);
+        std::unique_ptr<detail::EglContext> context = detail::EglContext::Open({}, &error);
         if (!context || !RendererFactory::AttachContext()) {
             std::fprintf(stderr, "%s\n", error.c_str());
             std::exit(1);

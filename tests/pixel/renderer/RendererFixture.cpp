@@ -84,7 +84,7 @@ RendererFixture::~RendererFixture() { SetLogSink(nullptr); }
 
 void RendererFixture::SetUp() {
     std::string error;
-    mEgl = EglContext::Create(true, &error);
+    mEgl = detail::EglContext::Open({true, kSurfaceWidth, kSurfaceHeight}, &error);
     ASSERT_TRUE(mEgl) << error;
     ASSERT_TRUE(Attach());
 }
@@ -155,7 +155,7 @@ void RendererFixture::ForgetDriverErrors() { mKnownDriverErrors = RendererFactor
 void RendererFixture::RestartEgl() {
     mEgl.reset();
     std::string error;
-    mEgl = EglContext::Create(true, &error);
+    mEgl = detail::EglContext::Open({true, kSurfaceWidth, kSurfaceHeight}, &error);
     ASSERT_TRUE(mEgl) << error;
 }
 

@@ -6,7 +6,7 @@
 #include "moka/renderer/IRenderTarget.h"
 #include "moka/renderer/ITextureObject.h"
 #include "moka/renderer/RendererFactory.h"
-#include "tests/support/EglContext.h"
+#include "moka/host/EglContext.h"
 
 #include <GLES3/gl3.h>
 #include <gtest/gtest.h>
@@ -106,12 +106,14 @@ protected:
     // For tests that make the driver complain on purpose.
     void ForgetDriverErrors();
 
-    EglContext& GetEgl() { return *mEgl; }
+    // The default frame buffer.
+    static constexpr int kSurfaceWidth = 64;
+    static constexpr int kSurfaceHeight = 48;
     // Ends the context and begins another one.
     void RestartEgl();
 
 private:
-    std::unique_ptr<EglContext> mEgl;
+    std::unique_ptr<detail::EglContext> mEgl;
     std::vector<std::string> mErrors;
     std::uint64_t mKnownDriverErrors = 0;
 };

@@ -127,9 +127,8 @@ TEST_P(TextureCopyTest, ATextureDrawsItselfTexelForTexelThroughAnyState) {
 }
 
 TEST_P(TextureCopyTest, ATextureDrawsItselfIntoTheLowerLeftOfTheDefaultFrameBuffer) {
-    if (!GetEgl().HasSurface()) GTEST_SKIP() << "this driver has no pbuffers";
-    constexpr int kWidth = EglContext::kSurfaceWidth;
-    constexpr int kHeight = EglContext::kSurfaceHeight;
+    constexpr int kWidth = kSurfaceWidth;
+    constexpr int kHeight = kSurfaceHeight;
     TargetPtr const target(RendererFactory::CreateRenderTargetFromDefault(kWidth, kHeight));
     Clear(*target, kBlue);
     TexturePtr const source = MakeTexture(Image::Pattern(8, 8));
