@@ -37,7 +37,9 @@ function(moka_library name kind)
     target_link_libraries(${name} PRIVATE $<BUILD_INTERFACE:moka_compile_options> ${arg_PRIVATE})
   endif()
   if(arg_OUTPUT)
-    set_target_properties(${name} PROPERTIES OUTPUT_NAME ${arg_OUTPUT} VERSION ${PROJECT_VERSION} SOVERSION 0)
+    # Installed, the libraries find each other where they lie.
+    set_target_properties(${name} PROPERTIES
+      OUTPUT_NAME ${arg_OUTPUT} VERSION ${PROJECT_VERSION} SOVERSION 0 INSTALL_RPATH "\$ORIGIN")
   endif()
 endfunction()
 

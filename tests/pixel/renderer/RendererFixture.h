@@ -2,11 +2,11 @@
 // behind: no object of any kind, no GL error, no log line that it did not expect.
 #pragma once
 
+#include "moka/host/EglContext.h"
 #include "moka/renderer/IDepthStencilBuffer.h"
 #include "moka/renderer/IRenderTarget.h"
 #include "moka/renderer/ITextureObject.h"
 #include "moka/renderer/RendererFactory.h"
-#include "moka/host/EglContext.h"
 
 #include <GLES3/gl3.h>
 #include <gtest/gtest.h>
