@@ -1,0 +1,65 @@
+#include "moka/base/jni/JNIAutoThread.h"
+
+#include "moka/base/log/AndroidLog.h"
+
+#include <sys/prctl.h>
+
+namespace Moka {
+namespace {
+
+constexpr jint kJniVersion = JNI_VERSION_1_6;
+
+// The two platforms' jni.h disagree about AttachCurrentThread's first parameter.
+#ifdef __ANDROID__
+using AttachedEnv = JNIEnv;
+#else
+using AttachedEnv = void;
+#endif
+
+// The system's name for this thread, so that a debugger shows one name on both sides.
+struct ThreadName {
+    char text[16] = {}; // as long as the system keeps
+
+    ThreadName() {
+        prctl(PR_GET_NAME, text);
+        // A cut or foreign name need not be the modified UTF-8 that a VM may insist on.
+        for (char& c : text) {
+            if (static_cast<unsigned char>(c) >= 0x80) c = '?';
+        }
+    }
+};
+
+} // namespace
+
+JNIAutoThread::JNIAutoThread(JavaVM* vm) : mVm(vm) {
+    if (!vm) {
+        __android_log_print(ANDROID_LOG_ERROR, "mok_log", "JNIAutoThread: there is no Java VM");
+        return;
+    }
+    void* env = nullptr;
+    jint status = vm->GetEnv(&env, kJniVersion);
+    if (status == JNI_OK) {
+        mEnv = static_cast<JNIEnv*>(env);
+        return;
+    }
+    ThreadName name;
+    if (status == JNI_EDETACHED) {
+        JavaVMAttachArgs arguments = {};
+        arguments.version = kJniVersion;
+        arguments.name = name.text;
+        status = vm->AttachCurrentThread(reinterpret_cast<AttachedEnv**>(&mEnv), &arguments);
+        mHasAttached = status == JNI_OK;
+    }
+    if (!mHasAttached) {
+        mEnv = nullptr;
+        __android_log_print(ANDROID_LOG_ERROR, "mok_log",
+                            "JNIAutoThread: the Java VM does not take thread '%s' (status %d)", name.text,
+                            static_cast<int>(status));
+    }
+}
+
+JNIAutoThread::~JNIAutoThread() {
+    if (mHasAttached) mVm->DetachCurrentThread();
+}
+
+} // namespace Moka

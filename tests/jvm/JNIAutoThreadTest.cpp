@@ -1,0 +1,145 @@
+#include "moka/base/jni/JNIAutoThread.h"
+#include "moka/base/log/AndroidLog.h"
+#include "tests/jvm/JavaMachine.h"
+#include "tests/support/LogCapture.h"
+
+#include <atomic>
+#include <gtest/gtest.h>
+#include <pthread.h>
+#include <thread>
+#include <vector>
+
+namespace Moka::Testing {
+namespace {
+
+bool IsAttached() {
+    void* env = nullptr;
+    return JavaMachine::GetVm()->GetEnv(&env, JNI_VERSION_1_6) == JNI_OK;
+}
+
+template <class Body>
+void OnOtherThread(Body body) {
+    std::thread(body).join();
+}
+
+std::string GetJavaThreadName(JNIEnv* env) {
+    jclass const type = env->FindClass("java/lang/Thread");
+    jmethodID const current = env->GetStaticMethodID(type, "currentThread", "()Ljava/lang/Thread;");
+    jmethodID const getName = env->GetMethodID(type, "getName", "()Ljava/lang/String;");
+    jobject const thread = env->CallStaticObjectMethod(type, current);
+    if (env->ExceptionCheck()) return {};
+    auto const name = static_cast<jstring>(env->CallObjectMethod(thread, getName));
+    if (env->ExceptionCheck()) return {};
+    char text[64] = {};
+    env->GetStringUTFRegion(name, 0, env->GetStringLength(name), text);
+    return text;
+}
+
+// A VM that takes no thread, and counts.
+struct RefusingVm {
+    JNIInvokeInterface_ functions = {};
+    JavaVM vm = {};
+    static inline int attaches, detaches;
+
+    explicit RefusingVm(jint(JNICALL* getEnv)(JavaVM*, void**, jint)) {
+        attaches = detaches = 0;
+        functions.GetEnv = getEnv;
+        functions.AttachCurrentThread = [](JavaVM*, void** env, void*) -> jint {
+            ++attaches;
+            *env = env; // must not be believed
+            return JNI_ENOMEM;
+        };
+        functions.DetachCurrentThread = [](JavaVM*) -> jint {
+            ++detaches;
+            return JNI_OK;
+        };
+        vm.functions = &functions;
+    }
+};
+
+TEST(JNIAutoThread, AttachesAThreadForItsScopeUnderTheThreadsOwnName) {
+    OnOtherThread([] {
+        pthread_setname_np(pthread_self(), "loader \xc3\xa9");
+        EXPECT_FALSE(IsAttached());
+        for (int i = 0; i < 3; ++i) {
+            JNIAutoThread const thread(JavaMachine::GetVm());
+            ASSERT_NE(thread.GetEnv(), nullptr);
+            EXPECT_TRUE(IsAttached());
+            EXPECT_EQ(GetJavaThreadName(thread.GetEnv()), "loader ??");
+        }
+        EXPECT_FALSE(IsAttached());
+    });
+}
+
+TEST(JNIAutoThread, OnlyTheOutermostDetaches) {
+    OnOtherThread([] {
+        {
+            JNIAutoThread const outer(JavaMachine::GetVm());
+            {
+                JNIAutoThread const inner(JavaMachine::GetVm());
+                EXPECT_EQ(inner.GetEnv(), outer.GetEnv());
+            }
+            EXPECT_TRUE(IsAttached());
+            EXPECT_NE(outer.GetEnv()->FindClass("java/lang/Object"), nullptr);
+        }
+        EXPECT_FALSE(IsAttached());
+    });
+}
+
+TEST(JNIAutoThread, LeavesThreadsThatOthersAttachedAsTheyAre) {
+    {
+        JNIAutoThread const thread(JavaMachine::GetVm());
+        EXPECT_EQ(thread.GetEnv(), JavaMachine::GetMainEnv());
+    }
+    EXPECT_TRUE(IsAttached());
+
+    OnOtherThread([] {
+        void* env = nullptr;
+        ASSERT_EQ(JavaMachine::GetVm()->AttachCurrentThread(&env, nullptr), JNI_OK);
+        { JNIAutoThread const thread(JavaMachine::GetVm()); }
+        EXPECT_TRUE(IsAttached());
+        JavaMachine::GetVm()->DetachCurrentThread();
+    });
+}
+
+TEST(JNIAutoThread, ManyThreadsComeAndGoAtOnce) {
+    std::atomic<int> good{0};
+    std::vector<std::thread> threads;
+    for (int i = 0; i < 16; ++i) {
+        threads.emplace_back([&good] {
+            for (int round = 0; round < 20; ++round) {
+                {
+                    JNIAutoThread const thread(JavaMachine::GetVm());
+                    if (thread.GetEnv() && thread.GetEnv()->FindClass("java/lang/Object")) ++good;
+                }
+                if (IsAttached()) --good;
+            }
+        });
+    }
+    for (std::thread& thread : threads) thread.join();
+    EXPECT_EQ(good, 16 * 20);
+}
+
+TEST(JNIAutoThread, GivesNoEnvAndOneErrorLineWithoutAVmThatTakesTheThread) {
+    RefusingVm detached([](JavaVM*, void**, jint) -> jint { return JNI_EDETACHED; });
+    RefusingVm old([](JavaVM*, void**, jint) -> jint { return JNI_EVERSION; });
+    struct {
+        JavaVM* vm;
+        int attaches;
+    } const cases[] = {{nullptr, 0}, {&detached.vm, 1}, {&old.vm, 0}};
+    for (auto const& [vm, attaches] : cases) {
+        RefusingVm::attaches = 0;
+        LogCapture log;
+        {
+            JNIAutoThread const thread(vm);
+            EXPECT_EQ(thread.GetEnv(), nullptr);
+        }
+        EXPECT_EQ(RefusingVm::attaches, attaches);
+        EXPECT_EQ(RefusingVm::detaches, 0);
+        EXPECT_EQ(log.Count(ANDROID_LOG_ERROR, "JNIAutoThread: "), 1);
+        EXPECT_EQ(log.GetLines().size(), 1u);
+    }
+}
+
+} // namespace
+} // namespace Moka::Testing
