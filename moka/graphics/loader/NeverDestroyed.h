@@ -1,0 +1,27 @@
+// NeverDestroyed: a member whose destructor does not run, for what other threads still use while the process
+// ends.
+#pragma once
+
+#include "moka/base/NonAssignable.h"
+
+#include <utility>
+
+namespace Moka::detail {
+
+template <class T>
+class NeverDestroyed : NonAssignable {
+public:
+    template <class... Arguments>
+    explicit NeverDestroyed(Arguments&&... arguments) : mValue(std::forward<Arguments>(arguments)...) {}
+    ~NeverDestroyed() {}
+
+    T& operator*() { return mValue; }
+    T* operator->() { return &mValue; }
+
+private:
+    union {
+        T mValue;
+    };
+};
+
+} // namespace Moka::detail

@@ -1,0 +1,29 @@
+// CodecGate: stops the image codecs, so that a test can act while a file is being decoded or encoded. The
+// program that links CodecGate.cpp calls every codec through it.
+#pragma once
+
+namespace Moka::Testing {
+
+// While one exists, every decode and encode waits at the gate until it opens. One at a time.
+class CodecGate {
+public:
+    CodecGate();
+    ~CodecGate(); // opens
+    CodecGate(CodecGate const&) = delete;
+    CodecGate& operator=(CodecGate const&) = delete;
+
+    // Until a codec has come to the gate.
+    void AwaitArrival();
+    void Open();
+};
+
+// While one exists, every decode and encode throws std::bad_alloc.
+class ThrowingCodecs {
+public:
+    ThrowingCodecs();
+    ~ThrowingCodecs();
+    ThrowingCodecs(ThrowingCodecs const&) = delete;
+    ThrowingCodecs& operator=(ThrowingCodecs const&) = delete;
+};
+
+} // namespace Moka::Testing

@@ -1,0 +1,308 @@
+// The two front ends: what they log and call, and what happens when they are cancelled or destroyed.
+#include "tests/unit/loader/LoaderFixture.h"
+
+#include "moka/graphics/loader/BitmapLoader.h"
+
+#include <chrono>
+#include <cstdio>
+#include <fstream>
+
+namespace Moka::Testing {
+namespace {
+
+class FrontEnd : public LoaderFixture {
+protected:
+    // Two threads may call at once only where the test lets them.
+    template <class L>
+    typename L::Callback MakeCallback() {
+        typename L::Callback callback;
+        callback.onLoad = [this](int id, String const&, auto& bitmap) {
+            Note("load " + std::to_string(id) + " " + std::to_string(bitmap.GetWidth()));
+        };
+        callback.onLoadError = [this](int id, String const&) { Note("error " + std::to_string(id)); };
+        callback.onSave = [this](int id, String const&, void*) { Note("save " + std::to_string(id)); };
+        callback.onSaveError = [this](int id, String const&, void*) {
+            Note("save error " + std::to_string(id));
+        };
+        return callback;
+    }
+    void Note(std::string const& event) {
+        std::lock_guard<std::mutex> const lock(mutex);
+        events.push_back(event);
+    }
+    Events GetEvents() {
+        std::lock_guard<std::mutex> const lock(mutex);
+        return events;
+    }
+    void AwaitAll() {
+        MKBitmapLoader::WaitForAllSaveRequestsToEnd(queue.get());
+        MKBitmapLoader::WaitUntilMsgQueueRequired();
+    }
+
+    std::mutex mutex;
+    Events events;
+};
+
+template <class Loader>
+struct Traits;
+template <>
+struct Traits<MKBitmapLoader> {
+    static constexpr char const* kName = "MKBitmapLoader";
+};
+template <>
+struct Traits<BitmapLoader> {
+    static constexpr char const* kName = "BitmapLoader";
+};
+
+template <class L>
+class EitherFrontEnd : public FrontEnd {
+protected:
+    static std::string Format(char const* format, void const* address) {
+        char text[64];
+        std::snprintf(text, sizeof text, format, address);
+        return text;
+    }
+    // A line of the front end named "pad".
+    std::string Line(L const& loader, std::string const& rest) const {
+        return std::string(Traits<L>::kName) + Format("[%p:pad] ", &loader) + rest;
+    }
+};
+using FrontEnds = ::testing::Types<MKBitmapLoader, BitmapLoader>;
+TYPED_TEST_SUITE(EitherFrontEnd, FrontEnds);
+
+TYPED_TEST(EitherFrontEnd, LogsAndCallsInBothKindsOfBuild) {
+    TestImage const image = MakeGradient(5, 4);
+    for (bool const eng : {false, true}) {
+        System::SetBuildTypeEngMode(eng);
+        this->events.clear();
+        String const path = this->WritePicture("a.mki");
+        String const missing = this->Path("missing.mki");
+        String const bad = this->Path("bad.unknown");
+        auto const show = [&](String const& which, std::string const& before, std::string const& after) {
+            return before + (eng ? which.ToUtf8() + (after.empty() || after[0] == ')' ? "" : ", ") : "") +
+                   after;
+        };
+        auto const id = [&](String const& which, int number) {
+            return std::to_string(number) + (eng ? ", " + which.ToUtf8() : "");
+        };
+        void const* loaded = nullptr;
+        auto callback = this->template MakeCallback<TypeParam>();
+        callback.onLoad = [&](int, String const&, auto& bitmap) { loaded = &bitmap; };
+        auto loader = std::make_unique<TypeParam>("pad", &callback);
+        this->log.Clear();
+        unsigned char* const pixels = this->NewPixels(image);
+        EXPECT_TRUE(loader->RequestLoad(1, path, this->queue.get()));
+        this->AwaitAll();
+        EXPECT_TRUE(loader->RequestLoad(2, missing, this->queue.get(), 3, 2));
+        EXPECT_TRUE(loader->RequestSave(3, path, pixels, 5, 4, nullptr, 100));
+        EXPECT_FALSE(loader->RequestSave(4, path, nullptr, 5, 4, nullptr, 100));
+        EXPECT_TRUE(loader->RequestSave(5, bad, this->NewPixels(image), 5, 4, nullptr, 100));
+        this->AwaitAll();
+        loader->CancelLoadRequest(6);
+        loader->CancelAllLoadRequest();
+        EXPECT_EQ(this->GetEvents(), (Events{"error 2", "save 3", "save error 5"}));
+        TypeParam const& front = *loader;
+        std::vector<std::string> const expected{
+            this->Line(front, "RequestLoad(" + id(path, 1) + ") ret true"),
+            this->Line(front, "OnLoad(" + id(path, 1) + this->Format(", %p)", loaded)),
+            this->Line(front, "RequestLoad(" + id(missing, 2) + ") ret true"),
+            this->Line(front, "OnLoadError(" + id(missing, 2) + ")"),
+            this->Line(front, show(path, "RequestSave(", this->Format("%p) ret true", pixels))),
+            this->Line(front, eng ? "OnSave(" + path.ToUtf8() + ")" : "OnSave"),
+            this->Line(front, show(path, "RequestSave(", this->Format("%p) ret false", nullptr))),
+            this->Line(front, eng ? "OnSaveError(" + bad.ToUtf8() + ")" : "OnSaveError"),
+            this->Line(front, "CancelLoadRequest(6)"),
+            this->Line(front, "CancelAllLoadRequest()"),
+        };
+        for (std::string const& text : expected) {
+            LogLine const line = this->log.Find(text);
+            EXPECT_EQ(line.priority, ANDROID_LOG_INFO) << text;
+            EXPECT_EQ(line.tag, Traits<TypeParam>::kName) << text;
+        }
+        std::string const last = this->Line(front, std::string("~") + Traits<TypeParam>::kName);
+        loader.reset();
+        EXPECT_TRUE(this->log.Has(last));
+    }
+}
+
+TYPED_TEST(EitherFrontEnd, ListsAreHandedOn) {
+    auto callback = this->template MakeCallback<TypeParam>();
+    std::size_t count = 0;
+    callback.onLoadList = [&](int, String const&, auto& bitmaps) { count = bitmaps.size(); };
+    TypeParam loader("pad", &callback);
+    std::vector<Bitmap*> cpu(3);
+    std::vector<IMKBitmap*> graphics(3);
+    for (bool const eng : {false, true}) {
+        System::SetBuildTypeEngMode(eng);
+        loader.OnLoadList(1, "p", cpu);
+        loader.OnLoadList(1, "p", graphics);
+        void const* const list =
+            std::is_same_v<TypeParam, BitmapLoader> ? static_cast<void*>(&cpu) : &graphics;
+        EXPECT_TRUE(this->log.Has(this->Line(loader, std::string("OnLoadList(1, ") + (eng ? "p, " : "") +
+                                                         this->Format("%p, size3)", list))));
+        EXPECT_EQ(count, 3u);
+    }
+    EXPECT_EQ(this->log.Count(ANDROID_LOG_INFO, "OnLoadList"), 2) << "only its own kind";
+}
+
+TYPED_TEST(EitherFrontEnd, WithoutANameOnlyThePairIsLogged) {
+    {
+        TypeParam loader(nullptr, nullptr);
+        loader.RequestLoad(1, this->WritePicture("a.mki"), this->queue.get());
+        loader.RequestLoad(2, this->Path("missing.mki"), this->queue.get());
+        loader.CancelLoadRequest(3);
+        this->AwaitAll();
+    }
+    EXPECT_EQ(this->LinesOf(Traits<TypeParam>::kName), (Events{"OnCallbackPending", "OnCallbackCompleted",
+                                                               "OnCallbackPending", "OnCallbackCompleted"}));
+}
+
+TYPED_TEST(EitherFrontEnd, DestroyedWhileDecodingItCallsNobodyAndDoesNotWait) {
+    String const path = this->WritePicture("a.mki");
+    auto callback = this->template MakeCallback<TypeParam>();
+    CodecGate gate;
+    {
+        TypeParam loader("pad", &callback);
+        loader.RequestLoad(1, path, this->queue.get());
+        loader.RequestLoad(2, path, this->queue.get());
+        gate.AwaitArrival();
+    } // returns with the gate still closed
+    gate.Open();
+    this->AwaitAll();
+    EXPECT_EQ(this->GetEvents(), Events{});
+}
+
+TYPED_TEST(EitherFrontEnd, DestroyedWhileCallingItWaitsForTheCall) {
+    String const path = this->WritePicture("a.mki");
+    Flag entered;
+    Flag mayLeave;
+    bool left = false; // not atomic: the destructor is what makes it visible
+    auto callback = this->template MakeCallback<TypeParam>();
+    callback.onLoad = [&](int, String const&, auto&) {
+        entered.Set();
+        mayLeave.Wait();
+        // Time for a destructor that does not wait.
+        std::this_thread::sleep_for(std::chrono::milliseconds(20));
+        left = true;
+    };
+    auto loader = std::make_unique<TypeParam>("pad", &callback);
+    loader->RequestLoad(1, path, this->queue.get());
+    loader->RequestLoad(2, path, this->queue.get());
+    entered.Wait();
+    std::string const line = this->Line(*loader, std::string("~") + Traits<TypeParam>::kName);
+    std::thread destroyer([&] {
+        loader.reset();
+        EXPECT_TRUE(left);
+    });
+    this->AwaitLine(line);
+    mayLeave.Set();
+    destroyer.join();
+}
+
+TYPED_TEST(EitherFrontEnd, ACallbackMayRequestCancelAndDestroyOthers) {
+    String const path = this->WritePicture("a.mki");
+    auto callback = this->template MakeCallback<TypeParam>();
+    TypeParam loader("pad", &callback);
+    auto other = std::make_unique<TypeParam>("other", &callback);
+    Flag done;
+    auto busy = this->template MakeCallback<TypeParam>();
+    busy.onLoadError = [&](int, String const&) {
+        other.reset();
+        loader.CancelLoadRequest(1);
+        EXPECT_TRUE(loader.RequestLoad(1, path, nullptr, 2, 2));
+        EXPECT_TRUE(loader.RequestSave(3, this->Path("s.png"), new unsigned char[4](), 1, 1, nullptr, 100));
+        loader.CancelAllLoadRequest();
+        done.Set();
+    };
+    TypeParam acting("acting", &busy);
+    CodecGate gate;
+    acting.RequestLoad(0, this->Path("missing.mki"), this->queue.get());
+    loader.RequestLoad(1, path, this->queue.get());
+    other->RequestLoad(2, path, this->queue.get());
+    gate.Open();
+    done.Wait();
+    this->AwaitAll();
+    EXPECT_EQ(this->GetEvents(), Events{"save 3"});
+    loader.WaitForCallback();
+}
+
+TEST_F(FrontEnd, TheTwoKindsShareOneQueueAndOneThread) {
+    auto onGpu = MakeCallback<MKBitmapLoader>();
+    auto onCpu = MakeCallback<BitmapLoader>();
+    MKBitmapLoader graphics("graphics", &onGpu);
+    BitmapLoader cpu("cpu", &onCpu);
+    String const path = WritePicture("a.mki");
+    EXPECT_TRUE(MKBitmapLoader::startEventLoopBySelf());
+    EXPECT_TRUE(BitmapLoader::startEventLoopBySelf());
+    for (int id = 0; id < 4; id += 2) {
+        graphics.RequestLoad(id, path, queue.get(), 3, 3);
+        cpu.RequestLoad(id + 1, path, queue.get());
+    }
+    AwaitAll();
+    EXPECT_EQ(GetEvents(), (Events{"load 0 3", "load 1 5", "load 2 3", "load 3 5"}));
+    int threads = 0;
+    for (auto const& task : std::filesystem::directory_iterator("/proc/self/task")) {
+        std::string name;
+        std::getline(std::ifstream(task.path() / "comm"), name);
+        threads += name == "MokaBitmapLoade";
+    }
+    EXPECT_EQ(threads, 1);
+}
+
+TEST_F(FrontEnd, BitmapsAreSavedAndTheLoaderFreesACpuBitmapsPixels) {
+    TestImage image = MakeAlphaPattern(20, 10);
+    auto onGpu = MakeCallback<MKBitmapLoader>();
+    auto onCpu = MakeCallback<BitmapLoader>();
+    MKBitmapLoader graphics("graphics", &onGpu);
+    BitmapLoader cpu("cpu", &onCpu);
+    {
+        auto const gpuBitmap = MakeBitmap(image);
+        EXPECT_TRUE(graphics.RequestSave(1, Path("g.png"), *gpuBitmap, nullptr, 100));
+        Bitmap cpuBitmap;
+        cpuBitmap.Construct(NewPixels(image), 20, 10, 80, 1, false, true);
+        EXPECT_TRUE(cpu.RequestSave(2, Path("c.png"), cpuBitmap, nullptr, 100));
+        cpuBitmap.SetDeleteBuffer(false);
+        Bitmap empty;
+        EXPECT_FALSE(cpu.RequestSave(3, Path("e.png"), empty, nullptr, 100));
+    }
+    AwaitAll();
+    EncodeDirectly(image, Path("direct.png"));
+    EXPECT_EQ(ReadBytes("g.png"), ReadBytes("direct.png"));
+    EXPECT_EQ(ReadBytes("c.png"), ReadBytes("direct.png"));
+    EXPECT_EQ(GetEvents().size(), 2u);
+}
+
+TEST_F(FrontEnd, DestroyedWithSavesInFlightItLeavesTheFiles) {
+    TestImage const image = MakeGradient(20, 10);
+    auto callback = MakeCallback<MKBitmapLoader>();
+    CodecGate gate;
+    {
+        MKBitmapLoader loader("pad", &callback);
+        loader.RequestSave(1, Path("encoding.png"), NewPixels(image), 20, 10, nullptr, 100);
+        gate.AwaitArrival();
+        loader.RequestSave(2, Path("behind.png"), *MakeBitmap(image), nullptr, 100);
+    }
+    gate.Open();
+    AwaitAll();
+    EXPECT_TRUE(Exists("encoding.png"));
+    EXPECT_TRUE(Exists("behind.png"));
+    EXPECT_EQ(GetEvents(), Events{});
+}
+
+TEST_F(FrontEnd, CallbacksAreCopiedAndMayThrow) {
+    auto callback = MakeCallback<BitmapLoader>();
+    callback.onLoadError = [this](int id, String const&) {
+        Note("thrown " + std::to_string(id));
+        throw id;
+    };
+    BitmapLoader loader("pad", &callback);
+    callback = BitmapLoader::Callback();
+    for (int id : {1, 2}) loader.RequestLoad(id, Path("missing.mki"), queue.get());
+    AwaitAll();
+    EXPECT_EQ(GetEvents(), (Events{"thrown 1", "thrown 2"}));
+    EXPECT_EQ(log.Count(ANDROID_LOG_ERROR, "OnLoadError threw something that is no std::exception"), 2);
+    loader.WaitForCallback();
+}
+
+} // namespace
+} // namespace Moka::Testing

@@ -1,0 +1,316 @@
+// Loads through the loader's loop, seen by a listener.
+#include "tests/unit/loader/LoaderFixture.h"
+
+#include "moka/graphics/bitmap/IMKSubBitmap.h"
+#include "moka/graphics/bitmap/IMKTextureBitmap.h"
+#include "moka/graphics/task/WorkerTask.h"
+#include "tests/support/Queues.h"
+
+#include <stdexcept>
+
+namespace Moka::Testing {
+namespace {
+
+using detail::BitmapType;
+
+class Load : public LoaderFixture {
+protected:
+    bool Request(int id, String const& path, BitmapType type = BitmapType::Cpu, int width = 0,
+                 int height = 0) {
+        return Loader().RequestLoad(&listener, id, path, type, queue.get(), width, height);
+    }
+    int GetLoggedSerial(std::string const& line) const {
+        for (std::string const& text : log.GetTexts()) {
+            if (text.rfind(line, 0) == 0) return std::stoi(text.substr(text.find("request[") + 8));
+        }
+        return -1;
+    }
+
+    RecordingListener listener;
+};
+
+TEST_F(Load, PendingThenTheResultThenCompletedForEveryKind) {
+    for (char const* name : {"a.png", "a.webp", "a.mki"}) WritePicture(name);
+    EXPECT_TRUE(Request(1, Path("a.png"), BitmapType::Cpu));
+    EXPECT_TRUE(Request(2, Path("a.webp"), BitmapType::Graphics));
+    EXPECT_TRUE(Request(3, Path("a.mki"), BitmapType::Graphics, 3, 2));
+    EXPECT_TRUE(Request(4, Path("a.mki"), BitmapType::Cpu, 3, 2));
+    EXPECT_TRUE(Request(5, Path("a.png"), BitmapType::Cpu, 3, 0)) << "one side alone scales nothing";
+    listener.AwaitCompleted(5);
+    EXPECT_EQ(listener.GetEvents(),
+              (Events{"pending", "load 1 5x4", "completed", "pending", "load 2 5x4", "completed", "pending",
+                      "load 3 3x2", "completed", "pending", "load 4 3x2", "completed", "pending",
+                      "load 5 5x4", "completed"}));
+}
+
+TEST_F(Load, ATallPictureArrivesWholeAndTagged) {
+    TestImage const image = MakeGradient(7, 2 * kMaxSide + 9);
+    String const path = WritePicture("tall.mki", image.width, image.height);
+    RefPtr<IMKBitmap> kept;
+    listener.whenLoaded = [&](Bitmap*, IMKBitmap* bitmap) { kept = RefPtr<IMKBitmap>::Share(bitmap); };
+    Request(1, path, BitmapType::Graphics);
+    listener.AwaitCompleted(1);
+    ASSERT_TRUE(kept);
+    EXPECT_STREQ(kept->GetTag(), "BitmapLoaderImpl::LoadBitmap (CreateScaledCPUBitmap)");
+    Pixels pixels(image.pixels.size());
+    kept->GetBitmapData(kept->GetBitmapRect(), pixels.data());
+    EXPECT_EQ(pixels, image.pixels);
+}
+
+TEST_F(Load, LogsEachStep) {
+    System::SetBuildTypeEngMode(true);
+    String const path = WritePicture("a.mki");
+    std::string const text = path.ToUtf8();
+    AwaitIdle();
+    log.Clear();
+    Request(1, path, BitmapType::Graphics);
+    AwaitLine("BitmapLoaderImpl::EventLoop Wait!");
+    std::string const serial = std::to_string(GetLoggedSerial("BitmapLoaderImpl::AddRequest"));
+    EXPECT_EQ(LinesOf("BitmapLoaderImpl"),
+              (Events{"BitmapLoaderImpl::AddRequest; queue size(1) request[" + serial + "]",
+                      "BitmapLoaderImpl::EventLoop queue size(1)",
+                      "BitmapLoaderImpl::EventLoop process load request[" + serial + "]: " + text,
+                      "BitmapLoaderImpl::LoadBitmap Call OnLoad.",
+                      "BitmapLoaderImpl::LoadBitmap Call OnLoad finish.",
+                      "BitmapLoaderImpl::EventLoop process load request[" + serial + "] done: " + text,
+                      "BitmapLoaderImpl::EventLoop Wait!"}));
+    System::SetBuildTypeEngMode(false);
+    log.Clear();
+    Request(2, Path("missing.mki"), BitmapType::Graphics);
+    AwaitLine("BitmapLoaderImpl::EventLoop Wait!");
+    EXPECT_EQ(log.Count(ANDROID_LOG_INFO, folder.string()), 0) << "paths are for engineering builds";
+    EXPECT_EQ(log.Find("BitmapLoaderImpl::LoadBitmap (CreateScaledCPUBitmap): bitmap is null").priority,
+              ANDROID_LOG_ERROR);
+    EXPECT_TRUE(log.Has("BitmapLoaderImpl::LoadBitmap Call OnLoadError finish."));
+}
+
+TEST_F(Load, ACancelledDecodeCallsNobodyAndItsIdIsFreeAgain) {
+    String const path = WritePicture("a.mki");
+    for (BitmapType const type : {BitmapType::Cpu, BitmapType::Graphics}) {
+        RecordingListener other;
+        AwaitIdle();
+        log.Clear();
+        CodecGate gate;
+        Request(1, path, type);
+        gate.AwaitArrival();
+        Loader().RequestLoad(&other, 1, path, type, queue.get(), 0, 0);
+        Loader().CancelLoadRequest(&listener, 1);
+        EXPECT_TRUE(Request(1, path, type));
+        EXPECT_FALSE(Request(1, path, type));
+        Loader().CancelLoadRequest(&listener, 1);
+        Loader().CancelLoadRequest(&listener, 1);
+        EXPECT_TRUE(log.Has("BitmapLoaderImpl::CancelRequest; queue size(1) no request"));
+        gate.Open();
+        other.AwaitCompleted(1);
+        EXPECT_EQ(listener.GetEvents(), Events{});
+        std::string const serial = std::to_string(GetLoggedSerial("BitmapLoaderImpl::AddRequest"));
+        EXPECT_TRUE(log.Has("BitmapLoaderImpl::CancelRequest; queue size(1) request[" + serial + "]"));
+        EXPECT_TRUE(log.Has("BitmapLoaderImpl::LoadBitmap queue size(1). request[" + serial + "] canceled."));
+    }
+}
+
+TEST_F(Load, AnIdIsRefusedWhileItWaitsOrIsDecoded) {
+    String const path = WritePicture("a.mki");
+    RecordingListener other;
+    CodecGate gate;
+    EXPECT_TRUE(Request(1, path));
+    gate.AwaitArrival();
+    EXPECT_FALSE(Request(1, path)) << "being decoded";
+    EXPECT_TRUE(Request(2, path));
+    EXPECT_FALSE(Request(2, Path("another.mki"))) << "waiting";
+    EXPECT_TRUE(Loader().RequestLoad(&other, 1, path, BitmapType::Cpu, queue.get(), 0, 0));
+    EXPECT_FALSE(Loader().RequestLoad(nullptr, 1, path, BitmapType::Cpu, queue.get(), 0, 0));
+    gate.Open();
+    listener.AwaitCompleted(2);
+    other.AwaitCompleted(1);
+    EXPECT_TRUE(Request(1, path)) << "over";
+    listener.AwaitCompleted(3);
+}
+
+TEST_F(Load, CancelAllDropsTheLoadsOfOneListenerAndNothingElse) {
+    String const path = WritePicture("a.mki");
+    TestImage const image = MakeGradient(3, 3);
+    RecordingListener other;
+    CodecGate gate;
+    for (int id = 0; id < 5; ++id) {
+        Request(id, path);
+        Loader().RequestLoad(&other, id, path, BitmapType::Cpu, queue.get(), 0, 0);
+    }
+    Loader().RequestSave(&listener, 9, Path("s.png"), NewPixels(image), 3, 3, nullptr, 100);
+    gate.AwaitArrival();
+    Loader().CancelAllLoadRequest(&listener);
+    EXPECT_TRUE(log.Has("BitmapLoaderImpl::CancelAllRequest; queue size(6)"));
+    gate.Open();
+    other.AwaitCompleted(5);
+    listener.AwaitCompleted(1);
+    EXPECT_EQ(listener.GetEvents(), (Events{"pending", "save 9", "completed"}));
+}
+
+TEST_F(Load, BrokenFilesAreErrorsAndTheLoopGoesOn) {
+    std::string const whole = (WritePicture("whole.png", 30, 30), ReadBytes("whole.png"));
+    std::string const longName = (folder / std::string(700, 'x')).string();
+    std::vector<String> const paths{Path("missing.png"),
+                                    WriteBytes("empty.png", ""),
+                                    WriteBytes("noise.mki", "MKI1 and then something else altogether"),
+                                    WriteBytes("cut.png", whole.substr(0, whole.size() / 2)),
+                                    String(folder.string()),
+                                    String(longName + ".png"),
+                                    String(""),
+                                    String(".mki")};
+    int count = 0;
+    for (BitmapType const type : {BitmapType::Cpu, BitmapType::Graphics}) {
+        for (String const& path : paths) {
+            EXPECT_TRUE(Request(count, path, type));
+            listener.AwaitCompleted(count + 1);
+            EXPECT_EQ(listener.GetEvents()[static_cast<std::size_t>(count) * 3 + 1],
+                      "error " + std::to_string(count));
+            ++count;
+        }
+    }
+    Request(count, WritePicture("a.png"));
+    listener.AwaitCompleted(count + 1);
+    EXPECT_EQ(listener.GetEvents().size(), static_cast<std::size_t>(count + 1) * 3);
+    EXPECT_EQ(listener.GetEvents().end()[-2], "load " + std::to_string(count) + " 5x4");
+}
+
+TEST_F(Load, ALongPathOfAnyTextIsFoundAndItsLogLineCutAtACharacter) {
+    System::SetBuildTypeEngMode(true);
+    std::filesystem::path deep = folder;
+    while (deep.native().size() < 700) deep /= "\xe7\xb4\x99\xf0\x9f\x96\x8a\xc3\xa9 folder";
+    std::filesystem::create_directories(deep);
+    String const path((deep / "\xe7\x94\xbb.mki").string());
+    TestImage image = MakeGradient(5, 4);
+    ASSERT_TRUE(EncodeDirectly(image, path));
+    Request(1, path);
+    listener.AwaitCompleted(1);
+    EXPECT_EQ(listener.GetEvents()[1], "load 1 5x4");
+    std::string shown;
+    for (std::string const& text : LinesOf("BitmapLoaderImpl"))
+        if (text.find("process load request[") != std::string::npos && shown.empty())
+            shown = text.substr(text.find("]: ") + 3);
+    EXPECT_LE(shown.size(), 500u);
+    EXPECT_GT(shown.size(), 496u);
+    EXPECT_EQ(path.ToUtf8().compare(0, shown.size(), shown), 0);
+    EXPECT_EQ(String(shown).ToUtf8(), shown) << "a character was cut in two";
+}
+
+TEST_F(Load, WhatIsThrownIsOneLineAndTheRestStillComes) {
+    String const path = WritePicture("a.mki");
+    listener.whenNoted = [](std::string const& event) {
+        if (event == "pending") throw 7;
+        throw std::runtime_error(event);
+    };
+    Request(1, path);
+    Request(2, path, BitmapType::Graphics);
+    listener.AwaitCompleted(2);
+    AwaitIdle();
+    EXPECT_EQ(log.GetTexts(ANDROID_LOG_ERROR),
+              (Events{"OnCallbackPending threw something that is no std::exception",
+                      "OnLoad threw: load 1 5x4", "OnCallbackCompleted threw: completed",
+                      "OnCallbackPending threw something that is no std::exception",
+                      "OnLoad threw: load 2 5x4", "OnCallbackCompleted threw: completed"}));
+    listener.whenNoted = nullptr;
+    {
+        ThrowingCodecs const codecs;
+        Request(3, path);
+        Request(4, path, BitmapType::Graphics);
+        listener.AwaitCompleted(4);
+    }
+    EXPECT_EQ(listener.GetEvents()[7], "error 3");
+    EXPECT_EQ(listener.GetEvents()[10], "error 4");
+}
+
+TEST_F(Load, AGpuBitmapThatCannotBeMadeIsAnErrorThatEndsAsALoad) {
+    Loader().RequestLoad(&listener, 1, WritePicture("a.mki"), BitmapType::Graphics, nullptr, 0, 0);
+    listener.AwaitCompleted(1);
+    AwaitIdle();
+    EXPECT_EQ(listener.GetEvents(), (Events{"pending", "error 1", "completed"}));
+    EXPECT_TRUE(log.Has("BitmapLoaderImpl::LoadBitmap Call OnLoadError."));
+    EXPECT_TRUE(log.Has("BitmapLoaderImpl::LoadBitmap Call OnLoad finish."));
+}
+
+TEST_F(Load, ACpuBitmapDiesOnItsQueueBehindTheCallbacks) {
+    String const path = WritePicture("a.mki");
+    HandPumpedQueue pumped;
+    Bitmap* seen = nullptr;
+    listener.whenLoaded = [&](Bitmap* bitmap, IMKBitmap*) { seen = bitmap; };
+    listener.whenNoted = [&](std::string const& event) {
+        if (event == "completed") {
+            EXPECT_EQ(pumped.GetPendingCount(), 0);
+        }
+    };
+    Loader().RequestLoad(&listener, 1, path, BitmapType::Cpu, &pumped, 0, 0);
+    listener.AwaitCompleted(1);
+    Loader().WaitUntilMsgQueueRequired();
+    EXPECT_EQ(seen->GetBuffer()[3], 255) << "still alive";
+    EXPECT_EQ(pumped.RunAll(), 1);
+
+    CodecGate gate;
+    Loader().RequestLoad(&listener, 2, path, BitmapType::Cpu, &pumped, 0, 0);
+    gate.AwaitArrival();
+    Loader().CancelLoadRequest(&listener, 2);
+    gate.Open();
+    Loader().WaitUntilMsgQueueRequired();
+    EXPECT_EQ(pumped.RunAll(), 1) << "a cancelled load's, too";
+}
+
+TEST_F(Load, ACpuBitmapThatNoQueueTakesBelongsToWhoeverGotIt) {
+    String const path = WritePicture("a.mki");
+    RefusingQueue refusing;
+    std::unique_ptr<Bitmap> kept;
+    listener.whenLoaded = [&](Bitmap* bitmap, IMKBitmap*) { kept.reset(bitmap); };
+    for (IGLMsgQueue* none : {static_cast<IGLMsgQueue*>(&refusing), static_cast<IGLMsgQueue*>(nullptr)}) {
+        Loader().RequestLoad(&listener, 1, path, BitmapType::Cpu, none, 0, 0);
+        Loader().WaitForAllSaveRequestsToEnd();
+        Loader().WaitUntilMsgQueueRequired();
+        ASSERT_TRUE(kept);
+        EXPECT_EQ(kept->GetBuffer()[3], 255);
+        kept.reset();
+    }
+    CodecGate gate;
+    Loader().RequestLoad(&listener, 1, path, BitmapType::Cpu, &refusing, 0, 0);
+    gate.AwaitArrival();
+    Loader().CancelAllLoadRequest(&listener);
+    gate.Open();
+    Loader().WaitUntilMsgQueueRequired(); // nobody got this one: it went by itself, or the sanitizer tells
+}
+
+TEST_F(Load, ARefusingQueueStillGivesABitmap) {
+    using PixelTask = WorkerTask::DeleteArray<unsigned char const>;
+    // What the refusal of its deletion leaks by design is freed here, so that leaks show which are not.
+    RefusingQueue refusing(RefusingQueue::Predicate([](int, ITask* task) {
+        if (auto* const pixels = dynamic_cast<PixelTask*>(task)) pixels->run();
+        return true;
+    }));
+    IMKSubBitmap* strip = nullptr;
+    listener.whenLoaded = [&](Bitmap*, IMKBitmap* bitmap) {
+        strip = bitmap->GetTextureBitmap()->GetSubBitmap(0);
+    };
+    Loader().RequestLoad(&listener, 1, WritePicture("a.mki"), BitmapType::Graphics, &refusing, 0, 0);
+    listener.AwaitCompleted(1);
+    EXPECT_EQ(listener.GetEvents()[1], "load 1 5x4");
+    AwaitIdle();
+    while (strip->Unref() > 0) {
+    }
+}
+
+TEST_F(Load, WaitersForLoadsAreAllLetGo) {
+    String const path = WritePicture("a.mki");
+    CodecGate gate;
+    Request(1, path);
+    gate.AwaitArrival();
+    std::vector<std::thread> waiters;
+    for (int i = 0; i < 3; ++i)
+        waiters.emplace_back([this] {
+            Loader().WaitUntilMsgQueueRequired();
+            EXPECT_EQ(listener.GetEvents().size(), 3u);
+        });
+    std::string const line = "WaitUntilMsgQueueRequired - LoadTaskRunning -> Start Wait";
+    while (log.Count(ANDROID_LOG_INFO, line) < 3) std::this_thread::yield();
+    gate.Open();
+    for (std::thread& waiter : waiters) waiter.join();
+    EXPECT_GE(log.Count(ANDROID_LOG_INFO, "WaitUntilMsgQueueRequired - LoadTaskRunning -> End Wait"), 3);
+}
+
+} // namespace
+} // namespace Moka::Testing

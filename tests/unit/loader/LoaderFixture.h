@@ -1,0 +1,227 @@
+// LoaderFixture: the loader with its loop running, a render thread without GL, a folder of its own for files,
+// and the log. Every test ends with the loader idle, nothing alive on the render thread and nothing misused.
+#pragma once
+
+#include "moka/base/Bitmap.h"
+#include "moka/base/BitmapFactory.h"
+#include "moka/base/RefPtr.h"
+#include "moka/base/String.h"
+#include "moka/base/System.h"
+#include "moka/base/log/AndroidLog.h"
+#include "moka/graphics/bitmap/IMKBitmap.h"
+#include "moka/graphics/bitmap/ImageDecoding.h"
+#include "moka/graphics/bitmap/MKGraphicsFactory.h"
+#include "moka/graphics/loader/BitmapLoaderImpl.h"
+#include "moka/graphics/loader/MKBitmapLoader.h"
+#include "moka/host/TaskQueue.h"
+#include "moka/renderer/RendererFactory.h"
+#include "tests/support/LogCapture.h"
+#include "tests/support/RecordingRenderer.h"
+#include "tests/support/TestImages.h"
+#include "tests/unit/loader/CodecGate.h"
+
+#include <algorithm>
+#include <condition_variable>
+#include <filesystem>
+#include <fstream>
+#include <functional>
+#include <future>
+#include <gtest/gtest.h>
+#include <iterator>
+#include <memory>
+#include <mutex>
+#include <string>
+#include <thread>
+#include <vector>
+
+#include <unistd.h>
+
+namespace Moka::Testing {
+
+using detail::BitmapLoaderImpl;
+using Pixels = std::vector<unsigned char>;
+
+// A flag that threads wait for.
+class Flag {
+public:
+    void Set() { mPromise.set_value(); }
+    void Wait() const { mFuture.wait(); }
+    bool IsSet() const { return mFuture.wait_for(std::chrono::seconds(0)) == std::future_status::ready; }
+
+private:
+    std::promise<void> mPromise;
+    std::shared_future<void> mFuture{mPromise.get_future()};
+};
+
+class RecordingThread final : public TaskQueue {
+public:
+    explicit RecordingThread(int maxSide) {
+        RecordingRenderer::Reset();
+        RecordingRenderer::SetMaxTextureSize(maxSide);
+        Flag ready;
+        mThread = std::thread([&] {
+            RendererFactory::AttachContext();
+            ready.Set();
+            Run([] {});
+            RendererFactory::DetachContext();
+        });
+        ready.Wait();
+    }
+    ~RecordingThread() override {
+        RequestStop();
+        mThread.join();
+    }
+
+private:
+    std::thread mThread;
+};
+
+class LoaderFixture : public ::testing::Test {
+protected:
+    static constexpr int kMaxSide = 64;
+
+    void SetUp() override {
+        MKBitmapFactory_UseNativeDecoder();
+        folder = std::filesystem::temp_directory_path() / ("moka_loader_" + std::to_string(getpid()));
+        std::filesystem::create_directories(folder);
+        queue = std::make_unique<RecordingThread>(kMaxSide);
+        StartLoop();
+    }
+
+    void TearDown() override {
+        MKBitmapLoader::WaitForAllSaveRequestsToEnd(queue.get());
+        Loader().WaitUntilMsgQueueRequired();
+        AwaitIdle();
+        System::SetBuildTypeEngMode(false);
+        queue.reset();
+        EXPECT_EQ(RecordingRenderer::CountLiveObjects(), 0);
+        for (std::string const& violation : RecordingRenderer::GetViolations()) ADD_FAILURE() << violation;
+        std::filesystem::remove_all(folder);
+    }
+
+    virtual void StartLoop() { ASSERT_TRUE(MKBitmapLoader::startEventLoopBySelf()); }
+
+    static BitmapLoaderImpl& Loader() { return BitmapLoaderImpl::GetInstance(); }
+
+    String Path(std::string const& name) const { return String((folder / name).string()); }
+    bool Exists(std::string const& name) const { return std::filesystem::exists(folder / name); }
+
+    // A picture file of unique opaque pixels.
+    String WritePicture(std::string const& name, int width = 5, int height = 4) const {
+        TestImage image = MakeGradient(width, height);
+        String const path = Path(name);
+        EXPECT_TRUE(EncodeDirectly(image, path));
+        return path;
+    }
+    String WriteBytes(std::string const& name, std::string const& bytes) const {
+        std::ofstream(folder / name, std::ios::binary) << bytes;
+        return Path(name);
+    }
+    std::string ReadBytes(std::string const& name) const {
+        std::ifstream file(folder / name, std::ios::binary);
+        return {std::istreambuf_iterator<char>(file), {}};
+    }
+    static bool EncodeDirectly(TestImage& image, String const& path, int quality = 100) {
+        Bitmap bitmap;
+        return bitmap.Construct(image.pixels.data(), image.width, image.height, image.GetStride(), 1, false,
+                                false) &&
+               BitmapFactory::SaveBitmap(&bitmap, &path, quality);
+    }
+
+    static unsigned char* NewPixels(TestImage const& image) {
+        auto* const pixels = new unsigned char[image.pixels.size()];
+        std::copy(image.pixels.begin(), image.pixels.end(), pixels);
+        return pixels;
+    }
+    RefPtr<IMKBitmap> MakeBitmap(TestImage const& image, IGLMsgQueue* on = nullptr) const {
+        return RefPtr<IMKBitmap>::Adopt(MKGraphicsFactory::CreateBitmap(
+            on ? on : queue.get(), image.width, image.height, NewPixels(image), true, 1, false));
+    }
+
+    void AwaitLine(std::string const& text) const {
+        while (!log.Has(text)) std::this_thread::yield();
+    }
+    // The loop has said its last word on what was queued so far.
+    void AwaitIdle() const {
+        auto const isIdle = [this] {
+            std::vector<LogLine> const lines = log.GetLines();
+            for (auto line = lines.rbegin(); line != lines.rend(); ++line)
+                if (line->text.find("::EventLoop ") != std::string::npos)
+                    return line->text == "BitmapLoaderImpl::EventLoop Wait!";
+            return true;
+        };
+        while (!isIdle()) std::this_thread::yield();
+    }
+    // Without numbers and addresses; for comparing with the text that is promised.
+    std::vector<std::string> LinesOf(std::string const& tag) const {
+        std::vector<std::string> texts;
+        for (LogLine const& line : log.GetLines())
+            if (line.tag == tag) texts.push_back(line.text);
+        return texts;
+    }
+
+    std::filesystem::path folder;
+    LogCapture log;
+    std::unique_ptr<RecordingThread> queue;
+};
+
+// What a listener is told, in order: "pending", "load 1 5x4", "error 1", "save 1", "save error 1",
+// "completed".
+class RecordingListener : public BitmapLoaderInterface {
+public:
+    void OnLoad(int id, String const&, Bitmap& bitmap) override { Loaded(id, bitmap, &bitmap, nullptr); }
+    void OnLoad(int id, String const&, IMKBitmap& bitmap) override { Loaded(id, bitmap, nullptr, &bitmap); }
+    void OnLoadError(int id, String const&) override { Note("error " + std::to_string(id)); }
+    void OnSave(int id, String const&, void* data) override {
+        userData = data;
+        Note("save " + std::to_string(id));
+    }
+    void OnSaveError(int id, String const&, void* data) override {
+        userData = data;
+        Note("save error " + std::to_string(id));
+    }
+    void OnCallbackPending() override { Note("pending"); }
+    void OnCallbackCompleted() override { Note("completed"); }
+
+    std::vector<std::string> GetEvents() const {
+        std::lock_guard<std::mutex> const lock(mMutex);
+        return mEvents;
+    }
+    // Until this many requests have been completed.
+    void AwaitCompleted(int count) const {
+        std::unique_lock<std::mutex> lock(mMutex);
+        mChanged.wait(lock, [&] {
+            return std::count(mEvents.begin(), mEvents.end(), std::string("completed")) >= count;
+        });
+    }
+
+    std::function<void(Bitmap*, IMKBitmap*)> whenLoaded;
+    std::function<void(std::string const&)> whenNoted; // may throw
+    void* userData = nullptr;
+
+private:
+    template <class Result>
+    void Loaded(int id, Result& result, Bitmap* cpu, IMKBitmap* graphics) {
+        if (whenLoaded) whenLoaded(cpu, graphics);
+        Note("load " + std::to_string(id) + " " + std::to_string(result.GetWidth()) + "x" +
+             std::to_string(result.GetHeight()));
+    }
+    // The listener may be gone as soon as the event is seen.
+    void Note(std::string const& event) {
+        auto const hook = whenNoted;
+        {
+            std::lock_guard<std::mutex> const lock(mMutex);
+            mEvents.push_back(event);
+            mChanged.notify_all();
+        }
+        if (hook) hook(event);
+    }
+
+    std::mutex mutable mMutex;
+    std::condition_variable mutable mChanged;
+    std::vector<std::string> mEvents;
+};
+
+using Events = std::vector<std::string>;
+
+} // namespace Moka::Testing

@@ -1,0 +1,108 @@
+// The end of a process whose loader sleeps, works or waits. Each case ends a process of its own, which must
+// come to its end, with no crash and no leak that a sanitizer would report.
+#include "moka/graphics/bitmap/ImageDecoding.h"
+#include "moka/graphics/bitmap/MKGraphicsFactory.h"
+#include "moka/graphics/loader/MKBitmapLoader.h"
+#include "moka/renderer/RendererFactory.h"
+#include "tests/support/LogCapture.h"
+#include "tests/support/Queues.h"
+#include "tests/unit/loader/CodecGate.h"
+
+#include <cstdlib>
+#include <gtest/gtest.h>
+#include <memory>
+
+namespace Moka::Testing {
+namespace {
+
+class ProcessExit : public testing::Test {
+protected:
+    // Run the case in a fresh process instead of a fork, which would have one thread.
+    ProcessExit() { GTEST_FLAG_SET(death_test_style, "threadsafe"); }
+
+    static void ExpectCleanExit(void (*live)()) {
+        EXPECT_EXIT(
+            {
+                static LogCapture* const quiet = new LogCapture;
+                static_cast<void>(quiet);
+                MKBitmapFactory_UseNativeDecoder();
+                live();
+                std::exit(0);
+            },
+            testing::ExitedWithCode(0), "");
+    }
+};
+
+TEST_F(ProcessExit, WhileTheLoopSleeps) {
+    ExpectCleanExit([] {
+        MKBitmapLoader::startEventLoopBySelf();
+        MKBitmapLoader("pad", nullptr).RequestLoad(1, "missing.mki", nullptr);
+        MKBitmapLoader::WaitForAllSaveRequestsToEnd(nullptr);
+    });
+}
+
+// Requests when the loader's queue is gone.
+struct LateRequest {
+    ~LateRequest() {
+        auto* const pixels = new unsigned char[4]();
+        if (loader.RequestLoad(1, "missing.mki", nullptr)) std::_Exit(1);
+        if (loader.RequestSave(2, "s.png", pixels, 1, 1, nullptr, 100)) std::_Exit(1);
+        delete[] pixels;
+    }
+    MKBitmapLoader loader{"outlives the queue", nullptr};
+};
+
+TEST_F(ProcessExit, WhileTheLoopWasNeverStarted) {
+    ExpectCleanExit([] {
+        static LateRequest late;
+        MKBitmapLoader& loader = late.loader;
+        loader.RequestLoad(1, "missing.mki", nullptr);
+        loader.RequestSave(2, "s.png", new unsigned char[4](), 1, 1, nullptr, 100);
+    });
+}
+
+TEST_F(ProcessExit, InTheMiddleOfAFileWithMoreQueued) {
+    ExpectCleanExit([] {
+        static CodecGate gate;
+        static MKBitmapLoader loader("outlives the queue", nullptr);
+        MKBitmapLoader::startEventLoopBySelf();
+        loader.RequestSave(1, "s.unknown", new unsigned char[400](), 10, 10, nullptr, 100);
+        gate.AwaitArrival();
+        loader.RequestSave(2, "s.unknown", new unsigned char[400](), 10, 10, nullptr, 100);
+        for (int id = 0; id < 10; ++id) loader.RequestLoad(id, "missing.mki", nullptr);
+    });
+}
+
+TEST_F(ProcessExit, WithAReadBackThatTheQueueRefused) {
+    ExpectCleanExit([] {
+        static bool refuse = false;
+        static RefusingQueue queue(RefusingQueue::Predicate([](int, ITask*) { return refuse; }));
+        RendererFactory::AttachContext();
+        MKBitmapLoader::startEventLoopBySelf();
+        static IMKBitmap* const bitmap =
+            MKGraphicsFactory::CreateBitmap(&queue, 4, 4, nullptr, false, 1, false);
+        refuse = true;
+        MKBitmapLoader loader("pad", nullptr);
+        EXPECT_TRUE(loader.RequestSave(1, "s.png", *bitmap, nullptr, 100));
+    });
+}
+
+#if defined(MOKA_CHECKS) && MOKA_CHECKS
+TEST_F(ProcessExit, AFrontEndDestroyedInItsOwnCallbackIsFoundInDebugBuilds) {
+    EXPECT_DEATH(
+        {
+            std::unique_ptr<MKBitmapLoader> loader;
+            MKBitmapLoader::Callback callback;
+            callback.onLoadError = [&](int, String const&) { loader.reset(); };
+            loader = std::make_unique<MKBitmapLoader>("pad", &callback);
+            MKBitmapLoader::startEventLoopBySelf();
+            loader->RequestLoad(1, "missing.mki", nullptr);
+            MKBitmapLoader::WaitForAllSaveRequestsToEnd(nullptr);
+            MKBitmapLoader::WaitUntilMsgQueueRequired();
+        },
+        "a callback waits for itself");
+}
+#endif
+
+} // namespace
+} // namespace Moka::Testing

@@ -1,0 +1,199 @@
+// The save manager, over a loop on a thread that this program lends it.
+#include "moka/graphics/loader/MKBitmapSaveManager.h"
+
+#include "moka/base/MessageLoop.h"
+#include "tests/support/Queues.h"
+#include "tests/unit/loader/LoaderFixture.h"
+
+#include <stdexcept>
+
+namespace Moka::Testing {
+namespace {
+
+class SaveManager : public LoaderFixture {
+protected:
+    using Callback = MKBitmapSaveManager::SaveCallback;
+
+    void StartLoop() override {
+        static bool const started = [] {
+            std::thread([] { MKBitmapLoader::startEventLoop(); }).detach();
+            return true;
+        }();
+        ASSERT_TRUE(started);
+    }
+
+    // Results in order, and whether each came on the thread that asked.
+    struct Result {
+        SaveManager* test;
+        std::string text;
+    };
+    static void Succeeded(void* context, String const* path, void* userData) {
+        static_cast<SaveManager*>(context)->Note("saved ", *path, userData);
+    }
+    static void Failed(void* context, String const* path, void* userData) {
+        static_cast<SaveManager*>(context)->Note("failed ", *path, userData);
+    }
+    void Note(char const* what, String const& path, void* userData) {
+        std::lock_guard<std::mutex> const lock(mutex);
+        results.push_back(what + std::filesystem::path(path.ToUtf8()).filename().string());
+        lastUserData = userData;
+        lastThread = std::this_thread::get_id();
+        if (whenNoted) whenNoted();
+    }
+    Callback MakeCallback(void* userData = nullptr) { return {Succeeded, Failed, this, userData}; }
+    bool Request(MKBitmapSaveManager& manager, std::string const& name, Callback* callback) {
+        return manager.RequestSave(1, Path(name), *MakeBitmap(image), callback, 100);
+    }
+    // The files are there and the results are with the manager.
+    void AwaitSaved() {
+        MKBitmapLoader::WaitForAllSaveRequestsToEnd(queue.get());
+        AwaitIdle();
+    }
+
+    TestImage image = MakeGradient(20, 2 * kMaxSide);
+    std::mutex mutex;
+    Events results;
+    void* lastUserData = nullptr;
+    std::thread::id lastThread;
+    std::function<void()> whenNoted;
+    MessageLoop messages;
+};
+
+TEST_F(SaveManager, TwoResultsShareOneMessageAndComeInOrder) {
+    MKBitmapSaveManager manager;
+    Callback first = MakeCallback(&manager);
+    Callback second = MakeCallback(this);
+    CodecGate gate; // both are requested before either is done
+    EXPECT_TRUE(Request(manager, "a.png", &first));
+    EXPECT_TRUE(Request(manager, "no folder/b.png", &second));
+    EXPECT_EQ(manager.GetRequestSaveCount(), 2);
+    gate.Open();
+    AwaitSaved();
+    EXPECT_EQ(results, Events{}) << "only from the message loop";
+    EXPECT_EQ(manager.GetRequestSaveCount(), 2);
+    EXPECT_EQ(messages.RunPending(), 1);
+    EXPECT_EQ(results, (Events{"saved a.png", "failed b.png"}));
+    EXPECT_EQ(lastUserData, this);
+    EXPECT_EQ(manager.GetRequestSaveCount(), 0);
+    EXPECT_TRUE(EncodeDirectly(image, Path("direct.png")));
+    EXPECT_EQ(ReadBytes("a.png"), ReadBytes("direct.png"));
+    Events const expected{"SaveManager::RequestSave mSaveCount(1)",
+                          "SaveManager::RequestSave mSaveCount(2)",
+                          "SaveManager::sm_OnSave mSaveCount(2) hasError(0)",
+                          "SaveManager::sm_OnSave mSaveCount(2) hasError(1)",
+                          "SaveManager::sm_HandleMessage mSaveCount(1)",
+                          "SaveManager::sm_HandleMessage mSaveCount(0)"};
+    for (std::string const& text : expected) {
+        EXPECT_EQ(log.Find(text).priority, ANDROID_LOG_INFO) << text;
+        EXPECT_EQ(log.Find(text).tag, "mok_log") << text;
+    }
+    EXPECT_EQ(messages.RunPending(), 0);
+}
+
+TEST_F(SaveManager, WaitingHandsResultsOverOnTheWaitingThread) {
+    MKBitmapSaveManager manager;
+    Callback callback = MakeCallback();
+    for (char const* name : {"a.png", "b.mki"}) EXPECT_TRUE(Request(manager, name, &callback));
+    EXPECT_TRUE(Request(manager, "c.png", nullptr));
+    Callback neither;
+    EXPECT_TRUE(Request(manager, "d.png", &neither));
+    std::thread::id waiting;
+    std::thread([&] {
+        waiting = std::this_thread::get_id();
+        manager.WaitForSaveCompleting(queue.get());
+    }).join();
+    EXPECT_EQ(results, (Events{"saved a.png", "saved b.mki"}));
+    EXPECT_EQ(lastThread, waiting);
+    EXPECT_EQ(manager.GetRequestSaveCount(), 0);
+    for (char const* name : {"c.png", "d.png"}) EXPECT_TRUE(Exists(name));
+    EXPECT_TRUE(log.Has("SaveManager::WaitForSaveCompleting mSaveCount(0) End"));
+    messages.RunPending(); // what was sent finds nothing left
+    EXPECT_EQ(results.size(), 2u);
+}
+
+TEST_F(SaveManager, WithoutSavesWaitingTouchesNothing) {
+    MKBitmapSaveManager manager;
+    HandPumpedQueue pumped;
+    manager.WaitForSaveCompleting(&pumped);
+    manager.WaitForSaveCompleting(nullptr);
+    EXPECT_EQ(pumped.GetWaitCount(), 0);
+    EXPECT_EQ(LinesOf("mok_log"), (Events{"SaveManager::WaitForSaveCompleting mSaveCount(0) End",
+                                          "SaveManager::WaitForSaveCompleting mSaveCount(0) End"}));
+}
+
+TEST_F(SaveManager, SeveralThreadsMayWaitWhileTheMessageLoopRuns) {
+    MKBitmapSaveManager manager;
+    Callback callback = MakeCallback();
+    for (int round = 0; round < 5; ++round) {
+        results.clear();
+        for (int i = 0; i < 6; ++i) Request(manager, std::to_string(i) + ".mki", &callback);
+        std::vector<std::thread> waiters;
+        for (int i = 0; i < 3; ++i) waiters.emplace_back([&] { manager.WaitForSaveCompleting(queue.get()); });
+        while (manager.GetRequestSaveCount() > 0) messages.RunPending();
+        for (std::thread& waiter : waiters) waiter.join();
+        EXPECT_EQ(results, (Events{"saved 0.mki", "saved 1.mki", "saved 2.mki", "saved 3.mki", "saved 4.mki",
+                                   "saved 5.mki"}));
+    }
+}
+
+TEST_F(SaveManager, ACallbackMayRequestAnotherSaveAndThrow) {
+    MKBitmapSaveManager manager;
+    Callback callback = MakeCallback();
+    int left = 2;
+    whenNoted = [&] {
+        if (left-- > 0) {
+            EXPECT_TRUE(Request(manager, "again" + std::to_string(left) + ".png", &callback));
+        }
+        throw std::runtime_error("no");
+    };
+    Request(manager, "a.png", &callback);
+    Request(manager, "b.png", &callback);
+    manager.WaitForSaveCompleting(queue.get());
+    EXPECT_EQ(results, (Events{"saved a.png", "saved b.png", "saved again1.png", "saved again0.png"}));
+    EXPECT_EQ(log.Count(ANDROID_LOG_ERROR, "threw: no"), 4);
+}
+
+TEST_F(SaveManager, ARefusedRequestStaysCounted) {
+    MKBitmapSaveManager manager;
+    Callback callback = MakeCallback();
+    TestImage const nothing(0, 0);
+    auto const empty = RefPtr<IMKBitmap>::Adopt(
+        MKGraphicsFactory::CreateBitmap(queue.get(), reinterpret_cast<TextureObject const*>(this), 1));
+    EXPECT_FALSE(manager.RequestSave(1, Path("a.png"), *empty, &callback, 100));
+    EXPECT_EQ(manager.GetRequestSaveCount(), 1);
+    EXPECT_EQ(results, Events{});
+}
+
+TEST_F(SaveManager, DestroyedWithSavesAndResultsItLeavesTheFilesAndCallsNobody) {
+    CodecGate gate;
+    {
+        MKBitmapSaveManager manager;
+        Callback callback = MakeCallback();
+        gate.Open();
+        Request(manager, "result.png", &callback);
+        AwaitSaved();
+        CodecGate const closed;
+        Request(manager, "encoding.png", &callback);
+        gate.AwaitArrival();
+        Request(manager, "queued.png", &callback);
+        EXPECT_EQ(manager.GetRequestSaveCount(), 3);
+    }
+    AwaitSaved();
+    messages.RunPending();
+    EXPECT_TRUE(log.Has("SaveManager save remain 3"));
+    for (char const* name : {"result.png", "encoding.png", "queued.png"}) EXPECT_TRUE(Exists(name));
+    EXPECT_EQ(results, Events{});
+}
+
+TEST_F(SaveManager, WithoutAMessageLoopResultsComeToThoseWhoWait) {
+    std::thread([this] {
+        MKBitmapSaveManager manager;
+        Callback callback = MakeCallback();
+        Request(manager, "a.png", &callback);
+        manager.WaitForSaveCompleting(nullptr);
+        EXPECT_EQ(results, Events{"saved a.png"});
+    }).join();
+}
+
+} // namespace
+} // namespace Moka::Testing

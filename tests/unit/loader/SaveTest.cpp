@@ -1,0 +1,208 @@
+// Saves through the loader's loop, seen by a listener.
+#include "tests/unit/loader/LoaderFixture.h"
+
+#include "moka/graphics/bitmap/MKBitmap.h"
+#include "tests/support/Queues.h"
+#include "tests/unit/base/Allocation.h"
+
+#include <cstring>
+#include <limits>
+
+namespace Moka::Testing {
+namespace {
+
+// A bitmap whose read-back calls back when the test says so.
+class HeldBitmap final : public MKBitmap {
+public:
+    HeldBitmap(int width, int height) : MKBitmap(nullptr, 0, 0, width, height) {}
+    void GetBitmapDataAsync(Rect const& r, void* destination, void* userData,
+                            DataCallback callback) override {
+        std::memset(destination, 0xFF, static_cast<std::size_t>(GetWidth() * GetHeight() * 4));
+        deliver = [=] { callback(r, destination, userData); };
+    }
+    unsigned int GetPixel(Point const&) override { return 0; }
+    void GetPixelAsync(Point const&, void*, PixelCallback) override {}
+    void GetBitmapData(Rect const&, void*) override {}
+    IMKBitmap* Clone() override { return nullptr; }
+
+    std::function<void()> deliver;
+};
+
+class Save : public LoaderFixture {
+protected:
+    bool Request(int id, std::string const& name, int quality = 100, void* userData = nullptr) {
+        return Loader().RequestSave(&listener, id, Path(name), NewPixels(image), image.width, image.height,
+                                    userData, quality);
+    }
+    std::string EncodedDirectly(std::string const& extension, int quality = 100) {
+        EXPECT_TRUE(EncodeDirectly(image, Path("direct." + extension), quality));
+        return ReadBytes("direct." + extension);
+    }
+    void AwaitWaiters(int count) {
+        while (log.Count(ANDROID_LOG_INFO, "SaveTaskRunning -> Start Wait") < count)
+            std::this_thread::yield();
+    }
+
+    TestImage image = MakeAlphaPattern(40, 30);
+    RecordingListener listener;
+};
+
+TEST_F(Save, EveryFormatIsWrittenAsTheEncoderWouldAndUserDataComesBack) {
+    int count = 0;
+    for (std::string const extension : {"png", "jpg", "webp", "mki"}) {
+        EXPECT_TRUE(Request(count, "s." + extension, 60, &count));
+        Loader().WaitForAllSaveRequestsToEnd();
+        EXPECT_EQ(ReadBytes("s." + extension), EncodedDirectly(extension, 60)) << extension;
+        EXPECT_EQ(listener.userData, &count);
+        ++count;
+    }
+    EXPECT_EQ(listener.GetEvents(),
+              (Events{"pending", "save 0", "completed", "pending", "save 1", "completed", "pending", "save 2",
+                      "completed", "pending", "save 3", "completed"}));
+}
+
+TEST_F(Save, WhatCannotBeWrittenIsAnErrorAndTheLoopGoesOn) {
+    std::filesystem::create_directories(folder / "folder.png");
+    std::vector<std::string> const names{"s.unknown", "s", "no folder/s.png", "folder.png",
+                                         std::string(700, 'x') + ".png"};
+    int count = 0;
+    for (std::string const& name : names) EXPECT_TRUE(Request(count++, name));
+    struct Size {
+        int width;
+        int height;
+    };
+    constexpr int kHuge = std::numeric_limits<int>::max();
+    for (Size const size : {Size{0, 30}, Size{40, -1}, Size{kHuge, 1}, Size{kHuge, kHuge}}) {
+        EXPECT_TRUE(Loader().RequestSave(&listener, count++, Path("s.png"), NewPixels(image), size.width,
+                                         size.height, nullptr, 100));
+    }
+    {
+        listener.AwaitCompleted(count);
+        ThrowingCodecs const codecs;
+        EXPECT_TRUE(Request(count++, "s.png"));
+        listener.AwaitCompleted(count);
+    }
+    for (int i = 0; i < count; ++i)
+        EXPECT_EQ(listener.GetEvents()[static_cast<std::size_t>(i) * 3 + 1],
+                  "save error " + std::to_string(i));
+    EXPECT_EQ(log.Count(ANDROID_LOG_INFO, "BitmapLoaderImpl::SaveBitmap error bitmap construct fail"), 4);
+    EXPECT_FALSE(Exists("s.png"));
+    EXPECT_TRUE(Request(count, "s.png"));
+    listener.AwaitCompleted(count + 1);
+    EXPECT_EQ(listener.GetEvents().end()[-2], "save " + std::to_string(count));
+}
+
+TEST_F(Save, WithoutAListenerTheFileIsWritten) {
+    EXPECT_TRUE(Loader().RequestSave(nullptr, 1, Path("s.png"), NewPixels(image), 40, 30, nullptr, 100));
+    EXPECT_FALSE(Loader().RequestSave(&listener, 1, Path("s.png"), nullptr, 40, 30, nullptr, 100));
+    Loader().WaitForAllSaveRequestsToEnd();
+    EXPECT_EQ(ReadBytes("s.png"), EncodedDirectly("png"));
+    EXPECT_EQ(
+        log.Count(ANDROID_LOG_INFO, "BitmapLoaderImpl::SaveBitmap queue size(0). callback for request["), 1);
+}
+
+TEST_F(Save, ATallBitmapIsReadBackAndWrittenWhole) {
+    image = MakeGradient(9, 2 * kMaxSide + 5);
+    auto bitmap = MakeBitmap(image);
+    EXPECT_TRUE(Loader().RequestSave(&listener, 1, Path("s.png"), *bitmap, nullptr, 100));
+    bitmap = {}; // the read-back does without the caller's reference
+    MKBitmapLoader::WaitForAllSaveRequestsToEnd(queue.get());
+    EXPECT_EQ(ReadBytes("s.png"), EncodedDirectly("png"));
+}
+
+TEST_F(Save, WhatABitmapDoesNotCoverIsTransparent) {
+    TestImage const whole = MakeGradient(8, 8);
+    auto const bitmap = RefPtr<IMKBitmap>::Adopt(
+        MKGraphicsFactory::CreateBitmap(queue.get(), Rect(0, 2, 8, 5), 8, 8, whole.pixels.data(), 1));
+    EXPECT_TRUE(Loader().RequestSave(&listener, 1, Path("s.png"), *bitmap, nullptr, 100));
+    MKBitmapLoader::WaitForAllSaveRequestsToEnd(queue.get());
+    image = TestImage(8, 8);
+    for (int y = 2; y < 5; ++y)
+        for (int x = 0; x < 8; ++x) image.SetColor(x, y, whole.GetColor(x, y));
+    EXPECT_EQ(ReadBytes("s.png"), EncodedDirectly("png"));
+}
+
+TEST_F(Save, AnEmptyBitmapIsRefused) {
+    HeldBitmap noWidth(0, 5);
+    HeldBitmap noHeight(5, 0);
+    EXPECT_FALSE(Loader().RequestSave(&listener, 1, Path("s.png"), noWidth, nullptr, 100));
+    EXPECT_FALSE(Loader().RequestSave(&listener, 2, Path("s.png"), noHeight, nullptr, 100));
+    Loader().WaitForAllSaveRequestsToEnd();
+    EXPECT_EQ(listener.GetEvents(), Events{});
+}
+
+TEST_F(Save, WaitersWaitForTheReadBackAndTheFile) {
+    image = TestImage(4, 3);
+    std::fill(image.pixels.begin(), image.pixels.end(), static_cast<unsigned char>(0xFF));
+    HeldBitmap bitmap(4, 3);
+    EXPECT_TRUE(Loader().RequestSave(&listener, 1, Path("s.png"), bitmap, nullptr, 100));
+    std::vector<std::thread> waiters;
+    for (int i = 0; i < 3; ++i)
+        waiters.emplace_back([this] {
+            Loader().WaitForAllSaveRequestsToEnd();
+            EXPECT_TRUE(Exists("s.png"));
+            EXPECT_EQ(listener.GetEvents().size(), 3u);
+        });
+    AwaitWaiters(3);
+    EXPECT_TRUE(log.Has("WaitForAllSaveRequestsToEnd - SaveTaskRunning -> Start Wait, "
+                        "mPendingSaveRequestList->GetCount() = 1, mQueue->GetCount() = 0, "
+                        "mSaveTaskRunning = 0"));
+    CodecGate gate;
+    bitmap.deliver();
+    gate.AwaitArrival();
+    gate.Open();
+    for (std::thread& waiter : waiters) waiter.join();
+    EXPECT_EQ(ReadBytes("s.png"), EncodedDirectly("png"));
+}
+
+// Pending, waiting in the queue, and being encoded.
+TEST_F(Save, ARemovedCallbackLeavesTheFile) {
+    HeldBitmap bitmap(4, 3);
+    RecordingListener other;
+    EXPECT_TRUE(Loader().RequestSave(&listener, 1, Path("pending.png"), bitmap, nullptr, 100));
+    CodecGate gate;
+    Request(2, "encoding.png");
+    gate.AwaitArrival();
+    Request(3, "queued.png");
+    Loader().RequestSave(&other, 4, Path("other.png"), NewPixels(image), 40, 30, nullptr, 100);
+    Loader().RequestLoad(&listener, 5, Path("missing.png"), detail::BitmapType::Cpu, nullptr, 0, 0);
+    Loader().RemoveAllSaveCallback(&listener);
+    gate.Open();
+    bitmap.deliver();
+    Loader().WaitForAllSaveRequestsToEnd();
+    for (char const* name : {"pending.png", "encoding.png", "queued.png", "other.png"})
+        EXPECT_TRUE(Exists(name));
+    EXPECT_EQ(listener.GetEvents(), (Events{"pending", "error 5", "completed"})) << "a load is no save";
+    EXPECT_EQ(other.GetEvents(), (Events{"pending", "save 4", "completed"}));
+}
+
+TEST_F(Save, ALoadQueuedBehindASaveReadsWhatItWrote) {
+    Request(1, "s.mki");
+    Loader().RequestLoad(&listener, 2, Path("s.mki"), detail::BitmapType::Cpu, queue.get(), 0, 0);
+    listener.AwaitCompleted(2);
+    EXPECT_EQ(listener.GetEvents()[4], "load 2 40x30");
+}
+
+TEST_F(Save, ARequestThatMemoryRunsOutForIsRefusedAndLeavesThePixels) {
+    String const path = Path("s.png");
+    HeldBitmap bitmap(4, 3);
+    auto* const pixels = NewPixels(image);
+    bool saves = true;
+    bool savesBitmap = true;
+    bool loads = true;
+    {
+        FailAllocations const fail;
+        saves = Loader().RequestSave(&listener, 1, path, pixels, 40, 30, nullptr, 100);
+        savesBitmap = Loader().RequestSave(&listener, 1, path, bitmap, nullptr, 100);
+        loads = Loader().RequestLoad(&listener, 1, path, detail::BitmapType::Cpu, nullptr, 0, 0);
+    }
+    EXPECT_FALSE(saves);
+    EXPECT_FALSE(savesBitmap);
+    EXPECT_FALSE(loads);
+    delete[] pixels;
+    Loader().WaitForAllSaveRequestsToEnd();
+    EXPECT_EQ(listener.GetEvents(), Events{});
+}
+
+} // namespace
+} // namespace Moka::Testing
