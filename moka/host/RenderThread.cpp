@@ -1,10 +1,10 @@
 #include "moka/host/RenderThread.h"
 
 #include "moka/base/Check.h"
+#include "moka/base/RunGuarded.h"
 #include "moka/base/Thread.h"
 #include "moka/graphics/task/ITask.h"
 #include "moka/host/EglContext.h"
-#include "moka/host/RunLogged.h"
 #include "moka/renderer/IRendererDeviceCaps.h"
 
 #include <atomic>
@@ -36,7 +36,7 @@ private:
 std::atomic<bool> ProcessSlot::theTaken{false};
 
 bool RunCall(std::function<void()> const& function) {
-    return detail::RunLogged("RenderThread::Call: the function", function);
+    return RunGuarded("mok_log", "RenderThread::Call: the function", function);
 }
 
 class CallTask final : public ITask {

@@ -1,8 +1,8 @@
 #include "moka/host/TaskQueue.h"
 
+#include "moka/base/RunGuarded.h"
 #include "moka/base/log/AndroidLog.h"
 #include "moka/graphics/task/ITask.h"
-#include "moka/host/RunLogged.h"
 #include "moka/host/ShortLock.h"
 
 #include <algorithm>
@@ -75,7 +75,7 @@ void TaskQueue::Run(std::function<void()> const& onIdle) {
     mDone.consumer = std::this_thread::get_id();
     while (ITask* const first = AwaitTasks()) {
         for (ITask* task = first; task; task = TakeSoon()) RunTasks(task);
-        if (onIdle) detail::RunLogged("TaskQueue: the idle call", onIdle);
+        if (onIdle) RunGuarded("mok_log", "TaskQueue: the idle call", onIdle);
     }
     mDone.consumer = std::thread::id();
 }
@@ -126,7 +126,7 @@ void TaskQueue::RunTasks(ITask* first) {
     while (first) {
         {
             std::unique_ptr<ITask> const task(std::exchange(first, first->next));
-            detail::RunLogged("TaskQueue: a task", [&task] { task->run(); });
+            RunGuarded("mok_log", "TaskQueue: a task", [&task] { task->run(); });
         }
         MarkDone(++done);
     }

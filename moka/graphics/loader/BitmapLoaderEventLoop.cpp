@@ -3,12 +3,12 @@
 
 #include "moka/base/Bitmap.h"
 #include "moka/base/BitmapFactory.h"
+#include "moka/base/RunGuarded.h"
 #include "moka/graphics/bitmap/IMKBitmap.h"
 #include "moka/graphics/bitmap/MKGraphicsFactory.h"
 #include "moka/graphics/loader/BitmapLoaderInterface.h"
 #include "moka/graphics/loader/LoaderLog.h"
 #include "moka/graphics/loader/PathForLog.h"
-#include "moka/graphics/loader/RunGuarded.h"
 #include "moka/graphics/task/WorkerTask.h"
 
 #include <utility>

@@ -1,10 +1,10 @@
 #include "moka/graphics/loader/MKBitmapSaveManager.h"
 
 #include "moka/base/Handler.h"
+#include "moka/base/RunGuarded.h"
 #include "moka/base/log/AndroidLog.h"
 #include "moka/graphics/bitmap/IMKBitmap.h"
 #include "moka/graphics/loader/MKBitmapLoader.h"
-#include "moka/graphics/loader/RunGuarded.h"
 #include "moka/graphics/task/IGLMsgQueue.h"
 
 #include <algorithm>
@@ -82,8 +82,8 @@ void MKBitmapSaveManager::sm_HandleMessage(Handler*, void* manager, int) {
 void MKBitmapSaveManager::Dispatch(Save const& save) {
     auto* const function = save.hasError ? save.callback.onSaveFailed : save.callback.onSaveSucceeded;
     if (!function) return;
-    detail::RunGuarded(kTag, "MKBitmapSaveManager: a save's callback",
-                       [&] { function(save.callback.context, &save.path, save.callback.userData); });
+    RunGuarded(kTag, "MKBitmapSaveManager: a save's callback",
+               [&] { function(save.callback.context, &save.path, save.callback.userData); });
 }
 
 void MKBitmapSaveManager::WaitForSaveCompleting(IGLMsgQueue* queue) {
