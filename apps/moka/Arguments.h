@@ -1,12 +1,18 @@
-// Arguments.h: checks of arguments that several commands take. Each returns what is wrong, empty when
-// nothing.
+// Arguments.h: checks of arguments that are made in several places.
 #pragma once
+
+#include "apps/moka/Failure.h"
 
 #include <string>
 
 namespace Moka::Tool {
 
-// The library's paths are UTF-8; any other byte would name another file.
+// Returns what is wrong, empty when nothing. The library's paths are UTF-8; any other byte would name another
+// file.
 std::string CheckPath(std::string const& path);
+
+// Throws Failure, which begins with subject, unless files can be made in the folder. missing is the status
+// when there is no such folder.
+void CheckFolder(std::string const& subject, std::string const& folder, ExitStatus missing);
 
 } // namespace Moka::Tool

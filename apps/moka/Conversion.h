@@ -3,23 +3,16 @@
 // Memory:  the decoded pixels are gone before the read-back buffer is made; the GPU's copy before encoding.
 #pragma once
 
-#include "moka/base/BitmapFactory.h"
+#include "apps/moka/ConversionSteps.h"
 
 #include <string>
 
 namespace Moka::Tool {
 
-class Interruption;
-class LogCollector;
-class Progress;
-
 struct ConversionRequest {
     std::string input;
     std::string output;
-    int quality = 0;        // as BitmapFactory::SaveBitmap takes it
-    int maxTextureSize = 0; // 0 keeps the device's own
-    int width = 0;          // both 0 keeps the file's own size
-    int height = 0;
+    ConversionOptions options;
 };
 
 struct ConversionResult {
@@ -27,12 +20,6 @@ struct ConversionResult {
     ImageInfo output;
     int strips = 0;
     std::string renderer;
-};
-
-struct ConversionEnvironment {
-    LogCollector& log;
-    Progress& progress;
-    Interruption& interruption;
 };
 
 ConversionResult Convert(ConversionRequest const& request, ConversionEnvironment const& environment);

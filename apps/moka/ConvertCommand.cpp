@@ -1,6 +1,7 @@
 #include "apps/moka/ConvertCommand.h"
 
 #include "apps/moka/Arguments.h"
+#include "apps/moka/Batch.h"
 #include "apps/moka/Conversion.h"
 #include "apps/moka/Failure.h"
 #include "apps/moka/Interruption.h"
@@ -14,7 +15,7 @@
 #include <filesystem>
 #include <memory>
 #include <string>
-#include <unistd.h>
+#include <vector>
 
 namespace Moka::Tool {
 namespace {
@@ -24,15 +25,26 @@ namespace fs = std::filesystem;
 constexpr int kJpegQuality = 90;
 constexpr int kLosslessQuality = 100;
 constexpr int kUnset = -1;
+constexpr int kInFlight = 4;
+constexpr int kMaxInFlight = 64;
 
 constexpr char kDescription[] = "Convert between PNG, JPEG, WebP and mki, through the GPU";
 constexpr char kFooter[] =
-    "The input's format follows from its content, the output's from its extension. The image is decoded,\n"
-    "uploaded, shared, read back and encoded. PNG, mki and WebP keep every pixel, unless WebP is given a\n"
-    "quality below 100; JPEG lays what is transparent on white.";
+    "One file into another:        moka convert photo.jpg page.mki\n"
+    "Many files into a folder:     moka convert *.jpg --to mki --out pages\n\n"
+    "The input's format follows from its content, the output's from its extension, or with --to from that.\n"
+    "An image is decoded, uploaded, read back and encoded. PNG, mki and WebP keep every pixel,\n"
+    "unless WebP is given a quality below 100; JPEG lays what is transparent on white.\n"
+    "Of many, each keeps its name but for the extension. One that cannot be converted stops no other; it is\n"
+    "named at the end, and the exit status is 1. An interruption leaves no unfinished file.";
 
 struct ConvertOptions {
-    ConversionRequest request;
+    std::string input;
+    std::vector<std::string> others; // the output, or with a format further inputs
+    std::string format;              // empty: one file into another
+    std::string folder;
+    int inFlight = kInFlight;
+    ConversionOptions conversion;
     std::string size;
     int quality = kUnset;
     bool quiet = false;
@@ -66,11 +78,7 @@ void CheckOutput(std::string const& output) {
     if (fs::is_directory(path, error)) throw Failure(output + " is a folder; name a file to write");
     // Where a link leads is found out when saving.
     if (fs::is_symlink(path, error)) return;
-    fs::path const folder = path.has_parent_path() ? path.parent_path() : fs::path(".");
-    if (!fs::is_directory(folder, error))
-        throw Failure(output + ": there is no folder " + folder.string() + "; create it first");
-    if (access(folder.c_str(), W_OK | X_OK) != 0)
-        throw Failure(output + ": no permission to write in the folder " + folder.string());
+    CheckFolder(output, path.has_parent_path() ? path.parent_path().string() : ".", ExitStatus::Failed);
 }
 
 // What stands before the driver's details: "llvmpipe (LLVM 15.0.6, 256 bits)".
@@ -91,27 +99,111 @@ void PrintSummary(ConversionRequest const& request, ConversionResult const& resu
                 result.strips == 1 ? "" : "s", ShortName(result.renderer).c_str());
 }
 
-int ChooseQuality(ConvertOptions const& options) {
-    if (options.quality != kUnset) return options.quality;
-    String const output(options.request.output);
-    return BitmapFactory::GetFormatByExtension(&output) == ImageFormat::Jpeg ? kJpegQuality
-                                                                             : kLosslessQuality;
+// In the words of the parser, which cannot know how many there may be.
+std::string TakeOutput(ConvertOptions const& options) {
+    if (options.others.empty())
+        throw Failure(ExitStatus::Usage, "OUTPUT is required; see moka convert --help");
+    if (options.others.size() > 1)
+        throw Failure(ExitStatus::Usage, "The following argument was not expected: " + options.others[1] +
+                                             "; to convert many files, say --to and --out; see moka convert"
+                                             " --help");
+    return options.others.front();
 }
 
-void RunConvert(ConvertOptions const& options) {
-    ConversionRequest request = options.request;
-    CheckOutput(request.output);
-    if (!options.size.empty()) ParseSize(options.size, request.width, request.height);
-    request.quality = ChooseQuality(options);
+ConversionOptions Complete(ConvertOptions const& options, std::string const& output) {
+    ConversionOptions conversion = options.conversion;
+    if (!options.size.empty()) ParseSize(options.size, conversion.width, conversion.height);
+    String const text(output);
+    bool const isJpeg = BitmapFactory::GetFormatByExtension(&text) == ImageFormat::Jpeg;
+    int const usual = isJpeg ? kJpegQuality : kLosslessQuality;
+    conversion.quality = options.quality == kUnset ? usual : options.quality;
+    return conversion;
+}
 
-    ConversionResult result;
-    {
-        Interruption interruption;
-        LogCollector log(options.verbose);
-        Progress progress(!options.quiet && !options.verbose);
-        result = Convert(request, {log, progress, interruption});
-    }
+// Off the terminal, and without unfinished files; what is told of the result is told afterwards.
+template <class Work>
+auto RunGuarded(ConvertOptions const& options, Work const& work) {
+    Interruption interruption;
+    LogCollector log(options.verbose);
+    Progress progress(!options.quiet && !options.verbose);
+    return work({log, progress, interruption});
+}
+
+void RunSingle(ConvertOptions const& options) {
+    std::string const output = TakeOutput(options);
+    CheckOutput(output);
+    ConversionRequest const request{options.input, output, Complete(options, output)};
+    ConversionResult const result = RunGuarded(
+        options, [&](ConversionEnvironment const& environment) { return Convert(request, environment); });
     if (!options.quiet) PrintSummary(request, result);
+}
+
+void PrintSummary(ConvertOptions const& options, std::size_t total, BatchResult const& result) {
+    bool const hasSlash = options.folder.back() == '/';
+    std::printf("%zu of %zu image%s -> %s%s (%s), %.1f files/s\n", total - result.errors.size(), total,
+                total == 1 ? "" : "s", options.folder.c_str(), hasSlash ? "" : "/", options.format.c_str(),
+                static_cast<double>(total) / result.seconds);
+}
+
+void RunBatch(ConvertOptions const& options) {
+    std::vector<std::string> inputs{options.input};
+    inputs.insert(inputs.end(), options.others.begin(), options.others.end());
+    BatchRequest request;
+    request.files = PlanBatch(inputs, options.format, options.folder);
+    request.options = Complete(options, request.files.front().output);
+    request.inFlight = options.inFlight;
+    BatchResult const result = RunGuarded(options, [&](ConversionEnvironment const& environment) {
+        return ConvertBatch(request, environment);
+    });
+    for (std::string const& error : result.errors) PrintError(error);
+    if (!options.quiet) PrintSummary(options, inputs.size(), result);
+    if (!result.errors.empty()) throw Failure("");
+}
+
+void AddFiles(CLI::App& command, ConvertOptions& options) {
+    command.add_option("INPUT", options.input, "The image to read")
+        ->required()
+        ->check(CLI::Validator(CheckPath, ""));
+    command
+        .add_option("OUTPUT", options.others,
+                    "The file to write; replaced if it exists. With --to: further images to read")
+        ->check(CLI::Validator(CheckPath, ""));
+    CLI::Option* const format =
+        command
+            .add_option("--to", options.format,
+                        "Convert every file given into this format: png, jpg, jpeg, webp, mki")
+            ->type_name("FORMAT")
+            ->check(CLI::Validator(CheckFormat, ""));
+    CLI::Option* const folder =
+        command.add_option("--out", options.folder, "The folder to write them to; files there are replaced")
+            ->type_name("DIR")
+            ->check(CLI::Validator(CheckPath, ""));
+    format->needs(folder);
+    folder->needs(format);
+    command
+        .add_option("--jobs", options.inFlight,
+                    "Of many files, at most N in memory at a time; 4 unless given, up to 64")
+        ->type_name("N")
+        ->check(CLI::Range(1, kMaxInFlight).description(""))
+        ->needs(format);
+}
+
+void AddSettings(CLI::App& command, ConvertOptions& options) {
+    command
+        .add_option("--quality", options.quality,
+                    "0 to 100, of JPEG (90 unless given) and WebP (100, lossless, unless given)")
+        ->type_name("N")
+        ->check(CLI::Range(0, 100).description(""));
+    command.add_option("--size", options.size, "Scale to exactly this size while decoding")
+        ->type_name("WxH")
+        ->check(CLI::Validator(CheckSize, ""));
+    command
+        .add_option("--max-texture", options.conversion.maxTextureSize,
+                    "Use textures of at most N pixels a side; a taller image is cut into strips")
+        ->type_name("N")
+        ->check(CLI::Range(1, BitmapFactory::kMaxSide).description(""));
+    command.add_flag("-q,--quiet", options.quiet, "Print nothing but errors");
+    command.add_flag("-v,--verbose", options.verbose, "Print the library's log to stderr");
 }
 
 } // namespace
@@ -120,28 +212,9 @@ void AddConvertCommand(CLI::App& app) {
     auto const options = std::make_shared<ConvertOptions>();
     CLI::App* const command = app.add_subcommand("convert", kDescription);
     command->footer(kFooter);
-    command->add_option("INPUT", options->request.input, "The image to read")
-        ->required()
-        ->check(CLI::Validator(CheckPath, ""));
-    command->add_option("OUTPUT", options->request.output, "The file to write; replaced if it exists")
-        ->required()
-        ->check(CLI::Validator(CheckPath, ""));
-    command
-        ->add_option("--quality", options->quality,
-                     "0 to 100, of JPEG (90 unless given) and WebP (100, lossless, unless given)")
-        ->type_name("N")
-        ->check(CLI::Range(0, 100).description(""));
-    command->add_option("--size", options->size, "Scale to exactly this size while decoding")
-        ->type_name("WxH")
-        ->check(CLI::Validator(CheckSize, ""));
-    command
-        ->add_option("--max-texture", options->request.maxTextureSize,
-                     "Use textures of at most N pixels a side; a taller image is cut into strips")
-        ->type_name("N")
-        ->check(CLI::Range(1, BitmapFactory::kMaxSide).description(""));
-    command->add_flag("-q,--quiet", options->quiet, "Print nothing but errors");
-    command->add_flag("-v,--verbose", options->verbose, "Print the library's log to stderr");
-    command->callback([options] { RunConvert(*options); });
+    AddFiles(*command, *options);
+    AddSettings(*command, *options);
+    command->callback([options] { options->format.empty() ? RunSingle(*options) : RunBatch(*options); });
 }
 
 } // namespace Moka::Tool

@@ -3,52 +3,39 @@
 #include "apps/moka/Progress.h"
 
 #include <chrono>
+#include <climits>
+#include <cstdlib>
 #include <fcntl.h>
-#include <filesystem>
-#include <string>
 #include <string_view>
+#include <sys/resource.h>
 #include <unistd.h>
 
 namespace Moka::Tool {
 namespace {
 
-namespace fs = std::filesystem;
-
 // Also wakes the watcher for its end.
 constexpr int kWakeUp = SIGUSR1;
 constexpr auto kNextLook = std::chrono::milliseconds(2);
 
-bool IsTemporary(std::string const& file, int descriptor) {
+bool IsTemporary(std::string_view file, int descriptor) {
     constexpr std::string_view kSuffix = ".tmp";
-    std::string const name = file.substr(file.rfind('/') + 1);
+    std::string_view const name = file.substr(file.rfind('/') + 1);
     bool const isNamedSo = name.size() > kSuffix.size() && name.front() == '.' &&
-                           name.compare(name.size() - kSuffix.size(), kSuffix.size(), kSuffix) == 0;
+                           name.substr(name.size() - kSuffix.size()) == kSuffix;
     return isNamedSo && (fcntl(descriptor, F_GETFL) & O_ACCMODE) == O_WRONLY;
 }
 
-// Whether there was one. When it has been renamed in this moment, there is nothing to remove and the file is
-// whole.
-bool RemoveOpenTemporary() {
-    std::error_code error;
-    for (fs::directory_iterator entry("/proc/self/fd", error), end; !error && entry != end;
-         entry.increment(error)) {
-        std::error_code unreadable;
-        std::string const file = fs::read_symlink(entry->path(), unreadable).string();
-        if (unreadable || !IsTemporary(file, std::stoi(entry->path().filename().string()))) continue;
-        unlink(file.c_str());
-        return true;
-    }
-    return false;
+// What is open stays open.
+void ForbidOpening() {
+    rlimit files{};
+    getrlimit(RLIMIT_NOFILE, &files);
+    files.rlim_cur = 0;
+    setrlimit(RLIMIT_NOFILE, &files);
 }
 
 } // namespace
 
-void Interruption::Saving::Set(bool isSaving) {
-    std::lock_guard const lock(mInterruption.mMutex);
-    mInterruption.mIsSaving = isSaving;
-}
-
-Interruption::Interruption() {
+Interruption::Interruption() : mOpenFiles(opendir("/proc/self/fd")) {
     sigemptyset(&mSignals);
     for (int const signal : {SIGINT, SIGTERM, SIGHUP, kWakeUp}) {
         struct sigaction current = {};
@@ -67,30 +54,62 @@ Interruption::~Interruption() {
     pthread_kill(mThread.native_handle(), kWakeUp);
     mThread.join();
     pthread_sigmask(SIG_SETMASK, &mPreviousMask, nullptr);
+    if (mOpenFiles) closedir(mOpenFiles);
+}
+
+void Interruption::Enter() {
+    std::lock_guard const lock(mMutex);
+    ++mSavings;
+}
+
+void Interruption::Leave() {
+    std::lock_guard const lock(mMutex);
+    // Before whoever saved tells of a failure that is only ours.
+    if (--mSavings == 0 && mSignal) End();
 }
 
 void Interruption::Watch() {
     int signal = 0;
     sigwait(&mSignals, &signal);
     std::unique_lock lock(mMutex);
-    while (!mDone) {
-        if (!mIsSaving || RemoveOpenTemporary()) End(signal);
+    if (mDone) return;
+    mSignal = signal;
+    ForbidOpening();
+    for (;;) {
+        if (mSavings == 0 || RemoveOpenTemporary()) End();
         lock.unlock();
         std::this_thread::sleep_for(kNextLook);
         lock.lock();
     }
 }
 
+// Whether there was one. When it has been renamed in this moment, there is nothing to remove and the file is
+// whole.
+bool Interruption::RemoveOpenTemporary() const {
+    if (!mOpenFiles) return false;
+    rewinddir(mOpenFiles);
+    while (dirent const* const entry = readdir(mOpenFiles)) {
+        char file[PATH_MAX];
+        ssize_t const length = readlinkat(dirfd(mOpenFiles), entry->d_name, file, sizeof(file) - 1);
+        if (length < 0) continue; // "." and ".."
+        file[length] = '\0';
+        if (!IsTemporary(file, std::atoi(entry->d_name))) continue;
+        unlink(file);
+        return true;
+    }
+    return false;
+}
+
 // By the signal itself, so that a shell sees what happened.
-void Interruption::End(int signal) {
+void Interruption::End() const {
     Progress::EraseLine();
-    std::signal(signal, SIG_DFL);
+    std::signal(mSignal, SIG_DFL);
     sigset_t only;
     sigemptyset(&only);
-    sigaddset(&only, signal);
+    sigaddset(&only, mSignal);
     pthread_sigmask(SIG_UNBLOCK, &only, nullptr);
-    raise(signal);
-    _exit(128 + signal);
+    raise(mSignal);
+    _exit(128 + mSignal);
 }
 
 } // namespace Moka::Tool

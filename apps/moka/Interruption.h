@@ -1,14 +1,17 @@
 // Interruption: lets SIGINT, SIGTERM and SIGHUP end the process at any moment without leaving an unfinished
-// file. The signals are blocked everywhere and waited for by one thread. Outside a Saving scope there is
-// nothing to remove and the process dies at once. Inside one, the saving code has a temporary file
-// (".name.xxxxxx.tmp") open, or is about to, or has just given it its real name: the watcher finds it among
-// the process's open files, removes it and dies; it looks again until there is one or the scope ends, so no
-// moment in between is missed. Without /proc the scope ends first, with a whole file.
+// file. The signals are blocked everywhere and waited for by one thread, which then keeps the process from
+// opening any more files. Outside every Saving scope there is nothing to remove and the process dies at once.
+// Inside one, the saving code has a temporary file (".name.xxxxxx.tmp") open: the watcher finds it among the
+// process's open files, removes it and dies. Or it has just closed it, to give it its real name, or was about
+// to make it, which now fails: the watcher looks again until there is one or the last scope has ended. So no
+// moment is missed, and no later save leaves anything. Without /proc the scopes end first, with whole files.
 // Owner:   one per process, made before any other thread, so that all inherit the blocked signals. Signals
 //          that the process was started with ignoring stay ignored.
+// Saving:  scopes may overlap, while one thread makes the files, one after the other.
 #pragma once
 
 #include <csignal>
+#include <dirent.h>
 #include <mutex>
 #include <thread>
 
@@ -21,26 +24,31 @@ public:
     Interruption(Interruption const&) = delete;
     Interruption& operator=(Interruption const&) = delete;
 
+    // From before the temporary file is made until the file has its real name, or there is none. Any thread.
     class Saving {
     public:
-        explicit Saving(Interruption& interruption) : mInterruption(interruption) { Set(true); }
-        ~Saving() { Set(false); }
+        explicit Saving(Interruption& interruption) : mInterruption(interruption) { mInterruption.Enter(); }
+        ~Saving() { mInterruption.Leave(); }
         Saving(Saving const&) = delete;
         Saving& operator=(Saving const&) = delete;
 
     private:
-        void Set(bool isSaving);
         Interruption& mInterruption;
     };
 
 private:
+    void Enter();
+    void Leave();
     void Watch();
-    [[noreturn]] void End(int signal);
+    bool RemoveOpenTemporary() const;
+    [[noreturn]] void End() const;
 
     sigset_t mSignals{};
     sigset_t mPreviousMask{};
-    std::mutex mMutex; // held by the watcher while it ends the process, so that nothing is saved meanwhile
-    bool mIsSaving = false;
+    DIR* const mOpenFiles; // opened in time; null without /proc
+    std::mutex mMutex;     // held while the process is ended, so that nothing is told or saved meanwhile
+    int mSavings = 0;
+    int mSignal = 0; // that ends the process
     bool mDone = false;
     std::thread mThread;
 };

@@ -1,13 +1,15 @@
 // LogCollector: keeps the library's log off the terminal for its scope and turns its errors into a Failure.
 // The library reports a failure as a null and an error line, some as the line alone; so whoever used it asks
-// here whether there was one.
+// here whether there was one. With several files in work at once, a line belongs to the file that it names.
 // Thread:  lines from any thread; asked by any.
 #pragma once
 
 #include "moka/base/log/LogSink.h"
 
+#include <deque>
 #include <mutex>
 #include <string>
+#include <thread>
 
 namespace Moka::Tool {
 
@@ -23,17 +25,28 @@ public:
     std::string GetError() const;
     void Clear();
 
+    // The first error about this file, of the last few hundred errors; empty without one.
+    std::string GetErrorAbout(std::string const& path) const;
+    // The first error that this thread logged, of the last few hundred; all of its errors are then forgotten.
+    std::string TakeErrorOf(std::thread::id thread);
+
     // Throws the first error, if there is one.
     void ThrowError() const;
     // Throws the first error, or fallback when nothing was logged.
     [[noreturn]] void Throw(std::string const& fallback) const;
 
 private:
+    struct Error {
+        std::string text;
+        std::thread::id thread;
+    };
+
     void OnLine(LogLine const& line);
 
     bool const mVerbose;
     std::mutex mutable mMutex;
-    std::string mError;
+    std::string mFirst;
+    std::deque<Error> mErrors;
     LogSink mPrevious;
 };
 

@@ -1,5 +1,6 @@
 #include "apps/moka/Progress.h"
 
+#include <cmath>
 #include <cstdio>
 #include <unistd.h>
 
@@ -8,6 +9,19 @@ namespace {
 
 constexpr auto kQuietTime = std::chrono::seconds(1);
 constexpr auto kInterval = std::chrono::milliseconds(200);
+
+std::string DescribeCount(int done, int total, double seconds) {
+    char text[120];
+    if (done == 0) {
+        std::snprintf(text, sizeof(text), "convert  0/%d, %.1f s", total, seconds);
+        return text;
+    }
+    // The work grows with the files, as far as anybody knows.
+    long long const left = std::llround(seconds / done * (total - done));
+    std::snprintf(text, sizeof(text), "convert  %d/%d  %d%%  %.1f files/s  %lld:%02lld left", done, total,
+                  static_cast<int>(done * 100LL / total), done / seconds, left / 60, left % 60);
+    return text;
+}
 
 } // namespace
 
@@ -29,12 +43,19 @@ void Progress::EraseLine() {
     if (isatty(STDERR_FILENO)) std::fputs("\r\033[K", stderr);
 }
 
+std::string Progress::Describe() const {
+    std::chrono::duration<double> const elapsed = std::chrono::steady_clock::now() - mStart;
+    if (mTotalCount > 0) return DescribeCount(mDoneCount, mTotalCount, elapsed.count());
+    char text[80];
+    std::snprintf(text, sizeof(text), "%s, %.1f s", mStage.load(), elapsed.count());
+    return text;
+}
+
 void Progress::Draw() {
     std::unique_lock lock(mMutex);
     if (mChanged.wait_for(lock, kQuietTime, [this] { return mDone; })) return;
     do {
-        std::chrono::duration<double> const elapsed = std::chrono::steady_clock::now() - mStart;
-        std::fprintf(stderr, "\r\033[K%s, %.1f s", mStage.load(), elapsed.count());
+        std::fprintf(stderr, "\r\033[K%s", Describe().c_str());
     } while (!mChanged.wait_for(lock, kInterval, [this] { return mDone; }));
     EraseLine();
 }

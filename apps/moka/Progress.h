@@ -1,5 +1,6 @@
 // Progress: one line on the terminal that tells what is being done and for how long, for work that takes more
-// than a second. It is gone when the work is done. Writes nothing where stderr is no terminal.
+// than a second; or, for many files, how many are done, how fast, and how long the rest will take. It is gone
+// when the work is done. Writes nothing where stderr is no terminal.
 // Thread:  made, told and destroyed by one thread; a thread of its own draws.
 #pragma once
 
@@ -7,6 +8,7 @@
 #include <chrono>
 #include <condition_variable>
 #include <mutex>
+#include <string>
 #include <thread>
 
 namespace Moka::Tool {
@@ -21,13 +23,22 @@ public:
     // A literal.
     void SetStage(char const* stage) { mStage = stage; }
 
+    // From now on the line counts files instead.
+    void SetCount(int done, int total) {
+        mDoneCount = done;
+        mTotalCount = total;
+    }
+
     // Any thread.
     static void EraseLine();
 
 private:
     void Draw();
+    std::string Describe() const;
 
     std::atomic<char const*> mStage{"start"};
+    std::atomic<int> mDoneCount{0};
+    std::atomic<int> mTotalCount{0};
     std::chrono::steady_clock::time_point const mStart = std::chrono::steady_clock::now();
     std::mutex mMutex;
     std::condition_variable mChanged;

@@ -4,6 +4,8 @@
 #include "apps/moka/Failure.h"
 #include "apps/moka/InfoCommand.h"
 #include "moka/base/System.h"
+#include "moka/base/log/AndroidLog.h"
+#include "moka/base/log/LogSink.h"
 
 #include <CLI/CLI.hpp>
 #include <csignal>
@@ -60,6 +62,8 @@ int Run(int argc, char** argv) {
 int main(int argc, char** argv) {
     // A file over the permitted size then fails to be written instead of ending the process half way.
     std::signal(SIGXFSZ, SIG_IGN);
+    // What the library says is collected where it matters. Its threads may say more while the process ends.
+    Moka::SetLogPriority(ANDROID_LOG_ERROR);
     // The person who named a file may read its whole path in messages.
     Moka::System::SetBuildTypeEngMode(true);
     try {

@@ -26,6 +26,36 @@ TestImage MakeNoise(int side) {
     return image;
 }
 
+// What a person at a terminal sees.
+class Terminal {
+public:
+    Terminal() : mOwn(posix_openpt(O_RDWR | O_NOCTTY | O_NONBLOCK)) {
+        grantpt(mOwn);
+        unlockpt(mOwn);
+        mOther = open(ptsname(mOwn), O_RDWR | O_NOCTTY);
+    }
+    ~Terminal() {
+        close(mOther);
+        close(mOwn);
+    }
+    Terminal(Terminal const&) = delete;
+    Terminal& operator=(Terminal const&) = delete;
+
+    int GetFile() const { return mOther; }
+
+    std::string const& GetShown() {
+        char block[512];
+        for (ssize_t got = 0; (got = read(mOwn, block, sizeof(block))) > 0;)
+            mShown.append(block, static_cast<std::size_t>(got));
+        return mShown;
+    }
+
+private:
+    int mOwn;
+    int mOther = -1;
+    std::string mShown;
+};
+
 class InterruptionTest : public ToolTest {
 protected:
     InterruptionTest() { Save(MakeNoise(2000), "in.mki"); }
@@ -38,8 +68,8 @@ protected:
         return false;
     }
 
-    bool HasTemporary() const {
-        std::vector<std::string> const names = List();
+    bool HasTemporary(std::string const& folder = ".") const {
+        std::vector<std::string> const names = List(folder);
         return std::any_of(names.begin(), names.end(),
                            [](std::string const& name) { return name[0] == '.'; });
     }
@@ -98,36 +128,134 @@ TEST_F(InterruptionTest, ASignalThatWasIgnoredStaysIgnored) {
     EXPECT_THAT(List(), ElementsAre("in.mki", "out.webp", "short.mki"));
 }
 
-TEST_F(InterruptionTest, ATerminalShowsProgressAndIsLeftClean) {
-    int const terminal = posix_openpt(O_RDWR | O_NOCTTY);
-    ASSERT_GE(terminal, 0);
-    ASSERT_EQ(grantpt(terminal), 0);
-    ASSERT_EQ(unlockpt(terminal), 0);
+class TerminalTest : public InterruptionTest {
+protected:
+    // Makes the work take long without making the machine work.
+    static void Delay(MokaProcess const& process) {
+        process.Signal(SIGSTOP);
+        std::this_thread::sleep_for(std::chrono::milliseconds(1200));
+        process.Signal(SIGCONT);
+    }
+
+    // One line, drawn over and over, and gone at the end.
+    static void ExpectLeftClean(std::string const& shown) {
+        EXPECT_THAT(shown, EndsWith("\r\033[K"));
+        EXPECT_EQ(shown.find('\n'), std::string::npos);
+    }
+};
+
+TEST_F(TerminalTest, ShowsWhatIsBeingDone) {
+    Terminal terminal;
     ProcessOptions options;
-    options.terminal = open(ptsname(terminal), O_RDWR | O_NOCTTY);
+    options.terminal = terminal.GetFile();
     ASSERT_GE(options.terminal, 0);
     MokaProcess process(mFolder.string(), {"convert", "in.mki", "out.webp"}, options);
     ASSERT_TRUE(WaitFor([this] { return HasTemporary(); }));
-    // Makes the work take long without making the machine work.
-    process.Signal(SIGSTOP);
-    std::this_thread::sleep_for(std::chrono::milliseconds(1200));
-    process.Signal(SIGCONT);
-    std::string shown;
-    fcntl(terminal, F_SETFL, O_NONBLOCK);
-    auto const isShown = [&](char const* text) {
-        char block[512];
-        ssize_t const got = read(terminal, block, sizeof(block));
-        if (got > 0) shown.append(block, static_cast<std::size_t>(got));
-        return shown.find(text) != std::string::npos;
+    Delay(process);
+    auto const isShown = [&] { return terminal.GetShown().find("\r\033[Kencode, 1.") != std::string::npos; };
+    EXPECT_TRUE(WaitFor(isShown)) << terminal.GetShown();
+    EXPECT_EQ(process.Wait().status, 0);
+    ExpectLeftClean(terminal.GetShown());
+}
+
+TEST_F(TerminalTest, ShowsHowManyOfManyAreDone) {
+    std::vector<std::string> arguments{"convert", "in.mki"};
+    for (char const* const name : {"a.png", "b.png", "c.png"}) {
+        Save(MakeNoise(100), name);
+        arguments.push_back(name);
+    }
+    std::swap(arguments[1], arguments.back()); // what takes long comes last
+    std::filesystem::create_directory(mFolder / "out");
+    arguments.insert(arguments.end(), {"--to", "webp", "--out", "out"});
+    Terminal terminal;
+    ProcessOptions options;
+    options.terminal = terminal.GetFile();
+    ASSERT_GE(options.terminal, 0);
+    MokaProcess process(mFolder.string(), arguments, options);
+    ASSERT_TRUE(WaitFor([this] { return List("out").size() == 4; }));
+    Delay(process);
+    auto const isShown = [&] {
+        return ::testing::Matches(::testing::ContainsRegex("\r\033\\[Kconvert  3/4  75%  [0-9]+\\.[0-9] "
+                                                           "files/s  0:0[01] left"))(terminal.GetShown());
     };
-    EXPECT_TRUE(WaitFor([&] { return isShown("\r\033[Kencode, 1."); })) << shown;
-    ProcessResult const result = process.Wait();
-    EXPECT_EQ(result.status, 0);
-    isShown("");
-    EXPECT_THAT(shown, EndsWith("\r\033[K"));
-    EXPECT_EQ(shown.find('\n'), std::string::npos);
-    close(options.terminal);
-    close(terminal);
+    EXPECT_TRUE(WaitFor(isShown)) << terminal.GetShown();
+    EXPECT_EQ(process.Wait().status, 0);
+    ExpectLeftClean(terminal.GetShown());
+}
+
+class BatchInterruptionTest : public InterruptionTest {
+protected:
+    BatchInterruptionTest() {
+        EmptyFolder();
+        // Of different sizes, so that the moments of one file are not those of the next.
+        for (int i = 0; i < 12; ++i) {
+            std::string const name = std::to_string(i);
+            Save(MakeNoise(100 + 17 * i), name + ".png");
+            Save(MakeNoise(100 + 17 * i), name + "-expected.mki");
+            mArguments.push_back(name + ".png");
+        }
+        mArguments.insert(mArguments.end(), {"--to", "mki", "--out", "out", "-q"});
+    }
+
+    void SetUp() override {
+#ifdef __SANITIZE_ADDRESS__
+        GTEST_SKIP()
+            << "a tool that is being interrupted opens no more files; the sanitizer's checks need some";
+#endif
+    }
+
+    void EmptyFolder() const {
+        std::filesystem::remove_all(mFolder / "out");
+        std::filesystem::create_directory(mFolder / "out");
+    }
+
+    void ExpectOnlyWholeFiles() const {
+        for (std::string const& name : List("out")) {
+            std::string const expected = name.substr(0, name.find('.')) + "-expected.mki";
+            EXPECT_TRUE(ReadFile("out/" + name) == ReadFile(expected)) << name;
+        }
+    }
+
+    std::vector<std::string> mArguments{"convert"};
+};
+
+TEST_F(BatchInterruptionTest, AtAnyMomentLeavesOnlyWholeFiles) {
+    auto const start = std::chrono::steady_clock::now();
+    RunWell(mArguments);
+    auto const whole = std::chrono::steady_clock::now() - start;
+    ExpectOnlyWholeFiles();
+    EmptyFolder();
+    int interrupted = 0;
+    int halfway = 0;
+    for (int i = 0; i < 40; ++i) {
+        MokaProcess process(mFolder.string(), mArguments);
+        std::this_thread::sleep_for(whole * i / 40);
+        process.Signal(i % 2 == 0 ? SIGINT : SIGTERM);
+        ProcessResult const result = process.Wait();
+        interrupted += result.signal != 0;
+        EXPECT_EQ(result.err, "") << i;
+        std::size_t const count = List("out").size();
+        halfway += result.signal != 0 && count > 0 && count < 12;
+        ExpectOnlyWholeFiles();
+        EmptyFolder();
+    }
+    EXPECT_GT(interrupted, 0);
+    EXPECT_GT(halfway, 0);
+}
+
+// Saves follow one another, so that the end of one is the beginning of the next.
+TEST_F(BatchInterruptionTest, WhileATemporaryFileIsThere) {
+    for (int i = 0; i < 20; ++i) {
+        MokaProcess process(mFolder.string(), mArguments);
+        std::string const awaited = std::to_string(i % 10) + ".mki";
+        ASSERT_TRUE(WaitFor([&] { return std::filesystem::exists(mFolder / "out" / awaited); }));
+        ASSERT_TRUE(WaitFor([&] { return HasTemporary("out") || List("out").size() == 12; }));
+        process.Signal(SIGINT);
+        ProcessResult const result = process.Wait();
+        EXPECT_EQ(result.err, "") << i;
+        ExpectOnlyWholeFiles();
+        EmptyFolder();
+    }
 }
 
 } // namespace

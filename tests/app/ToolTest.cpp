@@ -53,9 +53,9 @@ TestImage ToolTest::Load(std::string const& name) const {
     return image;
 }
 
-std::vector<std::string> ToolTest::List() const {
+std::vector<std::string> ToolTest::List(std::string const& folder) const {
     std::vector<std::string> names;
-    for (auto const& entry : fs::directory_iterator(mFolder))
+    for (auto const& entry : fs::directory_iterator(mFolder / folder))
         names.push_back(entry.path().filename().string());
     std::sort(names.begin(), names.end());
     return names;

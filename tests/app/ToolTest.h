@@ -29,7 +29,7 @@ protected:
     // Empty when the file cannot be decoded.
     TestImage Load(std::string const& name) const;
     // Sorted; everything, hidden files as well.
-    std::vector<std::string> List() const;
+    std::vector<std::string> List(std::string const& folder = ".") const;
 
     ProcessResult Run(std::vector<std::string> const& arguments, ProcessOptions const& options = {}) const;
     // Fails the test unless the tool succeeds without a word on stderr.
