@@ -17,6 +17,7 @@
 #include "moka/graphics/bitmap/ImageDecoding.h"
 #include "moka/graphics/bitmap/MKGraphicsFactory.h"
 #include "moka/graphics/canvas/IMKCanvasBase.h"
+#include "moka/graphics/canvas/MKPaint.h"
 #include "moka/graphics/loader/BitmapLoader.h"
 #include "moka/graphics/loader/BitmapLoaderInterface.h"
 #include "moka/graphics/loader/MKBitmapLoader.h"

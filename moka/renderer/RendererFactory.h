@@ -14,6 +14,7 @@ namespace Moka {
 class IDepthStencilBuffer;
 class IRendererDeviceCaps;
 class IRenderTarget;
+class IShaderProgram;
 class ITextureObject;
 
 // Lowers what the device offers, so that the cutting of tall images can be seen with small ones.
@@ -55,13 +56,19 @@ public:
 
     static IDepthStencilBuffer* CreateDepthStencilBuffer(int width, int height);
 
+    // GLSL ES 1.00 or 3.00. Attributes take locations 0, 1, ... in the order of their declaration. Never
+    // null: sources that do not compile are reported with one error line, and the program then draws nothing.
+    // The name appears in messages and GL debuggers; all texts are copied.
+    static IShaderProgram* CreateShaderProgram(char const* vertexSource, char const* fragmentSource,
+                                               char const* name);
+
     // While deferred, the host's frame buffer is given back by Flush() instead of at every deactivation. Off
     // until switched on; a host switches it on when it calls Flush() whenever its queue runs empty.
     static void SetDeferred(bool on);
 
     // Before foreign GL: everything asked for so far has reached GL. The host's frame buffers, viewport,
     // culling, depth test and dither are as they were, pixel store holds GL's defaults, no sampler is bound;
-    // texture bindings are not given back. An active target stays the active one.
+    // texture bindings and the program are not given back. An active target stays the active one.
     static void Flush();
     // After foreign GL: forgets what the renderer believed the GL state to be.
     static void InvalidateState();

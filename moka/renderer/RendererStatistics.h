@@ -16,6 +16,7 @@ struct RendererStatistics {
     int renderTargets = 0; // objects of our interfaces
     int textureObjects = 0;
     int depthStencilBuffers = 0;
+    int programs = 0;
 
     std::uint64_t frameBufferSwitches = 0;
     std::uint64_t clears = 0;

@@ -25,7 +25,7 @@ void Surface::Grow(int w, int h) {
 }
 
 std::string ObjectState::GetName() const {
-    static char const* const kNames[] = {"texture ", "target ", "buffer "};
+    static char const* const kNames[] = {"texture ", "target ", "buffer ", "program "};
     return kNames[static_cast<int>(kind)] + std::to_string(number);
 }
 
@@ -68,6 +68,7 @@ RendererStatistics Device::CountObjects() const {
     result.renderTargets = CountLive(ObjectKind::RenderTarget, false);
     result.depthStencilBuffers = CountLive(ObjectKind::DepthStencilBuffer, false);
     result.renderBuffers = result.depthStencilBuffers;
+    result.programs = CountLive(ObjectKind::Program, false);
     std::set<Surface const*> storages;
     for (auto const& object : objects) {
         if (object->released || object->context != context) continue;

@@ -48,6 +48,7 @@ struct ObjectState {
 };
 
 struct TextureState;
+class RecordingProgram;
 class RecordingTarget;
 
 struct Device : NonAssignable {
@@ -93,6 +94,7 @@ struct Device : NonAssignable {
     std::unordered_map<void const*, TextureState*> texturesByAddress;
 
     RecordingTarget* active = nullptr;
+    RecordingProgram* currentProgram = nullptr;
     std::map<int, TextureState*> boundTextures;
     std::shared_ptr<Surface> host; // the host's frame buffer
 };

@@ -127,6 +127,7 @@ void RendererFactory::DetachContext() {
     device.CheckThread("renderer", "DetachContext");
     device.attached = false;
     device.active = nullptr;
+    device.currentProgram = nullptr;
     device.boundTextures.clear();
     device.host.reset();
 }
@@ -213,6 +214,16 @@ IDepthStencilBuffer* RendererFactory::CreateDepthStencilBuffer(int width, int he
     auto* const buffer = device.Add<RecordingBuffer>(width, height);
     device.Record(buffer->GetName(), "Create", arguments);
     return buffer;
+}
+
+IShaderProgram* RendererFactory::CreateShaderProgram(char const* vertexSource, char const* fragmentSource,
+                                                     char const* name) {
+    Device& device = Device::Get();
+    DeviceLock lock(device.mutex);
+    device.CheckThread("renderer", "CreateShaderProgram");
+    auto* const program = device.Add<RecordingProgram>(vertexSource, fragmentSource);
+    device.Record(program->GetName(), "Create", name ? name : "");
+    return program;
 }
 
 void RendererFactory::SetDeferred(bool on) {

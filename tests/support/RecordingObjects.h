@@ -2,7 +2,9 @@
 #pragma once
 
 #include "moka/renderer/IDepthStencilBuffer.h"
+#include "moka/renderer/IParameterBinding.h"
 #include "moka/renderer/IRenderTarget.h"
+#include "moka/renderer/IShaderProgram.h"
 #include "moka/renderer/ITextureObject.h"
 #include "moka/renderer/TextureDescriptor.h"
 #include "moka/renderer/TextureParameter.h"
@@ -104,6 +106,24 @@ private:
     int mHeight;
     bool mOffscreen;
     RecordingBuffer* mAttached = nullptr;
+};
+
+// Knows its uniforms from the declarations in the sources; none of them is ever removed.
+class RecordingProgram final : public ObjectState, public IShaderProgram {
+public:
+    static constexpr ObjectKind kKind = ObjectKind::Program;
+
+    RecordingProgram(int number_, int context_, char const* vertexSource, char const* fragmentSource);
+
+    void MakeCurrent() override;
+    void Release() override;
+    IParameterBinding* GetParameter(char const* name) override;
+
+    int liveParameters = 0;
+    std::map<std::string, std::string> values; // those that were set, by the uniform's name
+
+private:
+    std::map<std::string, BindingType> mTypes;
 };
 
 } // namespace Moka::Testing::detail

@@ -13,6 +13,12 @@ namespace {
 
 using DeviceLock = std::lock_guard<std::recursive_mutex>;
 
+// A released program stays as long as its handles do.
+bool MustStay(ObjectState const& object) {
+    return !object.released || (object.kind == ObjectKind::Program &&
+                                static_cast<RecordingProgram const&>(object).liveParameters > 0);
+}
+
 TextureState const& StateOf(ITextureObject const* texture) {
     return static_cast<RecordingTexture const*>(texture)->GetState();
 }
@@ -27,7 +33,7 @@ void RecordingRenderer::Reset() {
     Device& device = Device::Get();
     DeviceLock lock(device.mutex);
     auto const live = std::stable_partition(device.objects.begin(), device.objects.end(),
-                                            [](auto const& object) { return !object->released; });
+                                            [](auto const& object) { return MustStay(*object); });
     for (auto released = live; released != device.objects.end(); ++released) {
         if ((*released)->kind != ObjectKind::Texture) continue;
         device.texturesByAddress.erase(static_cast<TextureState&>(**released).memory);
@@ -44,6 +50,7 @@ void RecordingRenderer::Reset() {
     device.failingKinds.clear();
     device.lastNumber.clear();
     device.active = nullptr;
+    device.currentProgram = nullptr;
     device.boundTextures.clear();
     device.host.reset();
 }
@@ -126,6 +133,10 @@ std::string RecordingRenderer::NameOf(IDepthStencilBuffer const* buffer) {
     return buffer ? static_cast<RecordingBuffer const*>(buffer)->GetName() : "none";
 }
 
+std::string RecordingRenderer::NameOf(IShaderProgram const* program) {
+    return program ? static_cast<RecordingProgram const*>(program)->GetName() : "none";
+}
+
 std::vector<unsigned char> RecordingRenderer::GetTexels(ITextureObject const* texture) {
     DeviceLock lock(Device::Get().mutex);
     return StateOf(texture).surface->pixels;
@@ -156,6 +167,19 @@ std::string RecordingRenderer::GetActiveTarget() {
     return NameOf(device.active);
 }
 
+std::string RecordingRenderer::GetCurrentProgram() {
+    Device const& device = Device::Get();
+    DeviceLock lock(device.mutex);
+    return NameOf(device.currentProgram);
+}
+
+std::string RecordingRenderer::GetParameter(IShaderProgram const* program, std::string const& name) {
+    DeviceLock lock(Device::Get().mutex);
+    auto const& values = static_cast<RecordingProgram const*>(program)->values;
+    auto const found = values.find(name);
+    return found == values.end() ? std::string() : found->second;
+}
+
 std::string RecordingRenderer::GetBoundTexture(int unit) {
     Device const& device = Device::Get();
     DeviceLock lock(device.mutex);
@@ -171,8 +195,13 @@ std::string RecordingRenderer::GetAttachedBuffer(IRenderTarget const* target) {
 int RecordingRenderer::CountLiveObjects() {
     Device const& device = Device::Get();
     DeviceLock lock(device.mutex);
-    return device.CountLive(ObjectKind::Texture, true) + device.CountLive(ObjectKind::RenderTarget, true) +
-           device.CountLive(ObjectKind::DepthStencilBuffer, true);
+    int count = 0;
+    for (auto const& object : device.objects) {
+        if (!object->released) ++count;
+        if (object->kind != ObjectKind::Program) continue;
+        count += static_cast<RecordingProgram const&>(*object).liveParameters;
+    }
+    return count;
 }
 
 } // namespace Moka::Testing

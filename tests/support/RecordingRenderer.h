@@ -18,16 +18,19 @@
 namespace Moka {
 class IDepthStencilBuffer;
 class IRenderTarget;
+class IShaderProgram;
 class ITextureObject;
 } // namespace Moka
 
 namespace Moka::Testing {
 
-enum class ObjectKind { Texture, RenderTarget, DepthStencilBuffer };
+enum class ObjectKind { Texture, RenderTarget, DepthStencilBuffer, Program };
 
-// One call. Objects are named by kind and number in order of creation: "texture 1", "target 1", "buffer 1";
-// static functions belong to "renderer". Operations are named as in the interfaces; the deletion of a texture
-// is its "Release", a creation is the new object's "Create".
+// One call. Objects are named by kind and number in order of creation: "texture 1", "target 1", "buffer 1",
+// "program 1"; static functions belong to "renderer". Operations are named as in the interfaces; the deletion
+// of a texture is its "Release", a creation is the new object's "Create"; what is done to a handle on a
+// parameter is an operation of its program: "program 1 SetParameter uFactor 0.5", "program 1 ReleaseParameter
+// uFactor".
 struct RecordedCall {
     std::string object;
     std::string operation;
@@ -55,7 +58,7 @@ public:
     static void SetMaxTextureSize(int texels);
 
     // Makes the n-th creation from now fail (1 is the next one), or every one of a kind until
-    // StopFailing().
+    // StopFailing(). Programs are made in every case and are not counted.
     static void FailCreation(int n);
     static void FailCreations(ObjectKind kind);
     static void StopFailing();
@@ -70,6 +73,7 @@ public:
     static std::string NameOf(ITextureObject const* texture);
     static std::string NameOf(IRenderTarget const* target);
     static std::string NameOf(IDepthStencilBuffer const* buffer);
+    static std::string NameOf(IShaderProgram const* program);
 
     // The image, rows packed, in texture order. Not recorded, allowed on any thread and after release.
     static std::vector<unsigned char> GetTexels(ITextureObject const* texture);
@@ -83,10 +87,14 @@ public:
     // The targets' and textures' state as the renderer sees it now; names as in the calls, "none" for
     // nothing.
     static std::string GetActiveTarget();
+    static std::string GetCurrentProgram();
     static std::string GetBoundTexture(int unit);
     static std::string GetAttachedBuffer(IRenderTarget const* target);
 
-    // Objects not yet released, of whatever context.
+    // What a uniform was set to last: its numbers, separated by spaces; empty before.
+    static std::string GetParameter(IShaderProgram const* program, std::string const& name);
+
+    // Objects not yet released, and handles on parameters not yet deleted, of whatever context.
     static int CountLiveObjects();
 };
 

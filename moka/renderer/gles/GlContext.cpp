@@ -76,6 +76,11 @@ void GlContext::Delete(Orphan const& orphan) {
         state.ForgetFrameBuffer(orphan.name);
         --statistics.frameBuffers;
         return;
+    case GlNameKind::Program:
+        state.TakeOffProgram(orphan.name);
+        glDeleteProgram(orphan.name);
+        --statistics.programs;
+        return;
     }
 }
 

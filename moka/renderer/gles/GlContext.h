@@ -19,7 +19,7 @@
 namespace Moka::detail {
 
 // What may be dropped on any thread.
-enum class GlNameKind { Texture, FrameBuffer };
+enum class GlNameKind { Texture, FrameBuffer, Program };
 
 class GlContext {
 public:

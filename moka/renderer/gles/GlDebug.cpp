@@ -26,9 +26,10 @@ bool IsError(GLenum type, GLenum severity) {
            (severity == GL_DEBUG_SEVERITY_HIGH_KHR && type != GL_DEBUG_TYPE_PERFORMANCE_KHR);
 }
 
-void GL_APIENTRY OnMessage(GLenum, GLenum type, GLuint, GLenum severity, GLsizei, GLchar const* message,
-                           void const* statistics) {
-    if (!IsError(type, severity)) return;
+void GL_APIENTRY OnMessage(GLenum source, GLenum type, GLuint, GLenum severity, GLsizei,
+                           GLchar const* message, void const* statistics) {
+    // What a compiler has to say is logged, with the program's name, by who asked for the compilation.
+    if (source == GL_DEBUG_SOURCE_SHADER_COMPILER_KHR || !IsError(type, severity)) return;
     ++static_cast<GlStatistics*>(const_cast<void*>(statistics))->errors;
     __android_log_print(ANDROID_LOG_ERROR, "mok_log", "GL driver: %s", message);
 }

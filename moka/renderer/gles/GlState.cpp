@@ -103,6 +103,10 @@ GLuint GlRenderBufferAccess::Query() { return QueryName(GL_RENDERBUFFER_BINDING)
 
 void GlRenderBufferAccess::Apply(GLuint value, GLuint const*) { glBindRenderbuffer(GL_RENDERBUFFER, value); }
 
+GLuint GlProgramAccess::Query() { return QueryName(GL_CURRENT_PROGRAM); }
+
+void GlProgramAccess::Apply(GLuint value, GLuint const*) { glUseProgram(value); }
+
 GlState::GlState() : mUnits(static_cast<std::size_t>(QueryInteger(GL_MAX_COMBINED_TEXTURE_IMAGE_UNITS))) {
     mSamplerUnits.reserve(mUnits.size());
 }
@@ -116,6 +120,7 @@ void GlState::Invalidate() {
     obstacles.Forget();
     activeUnit.Forget();
     renderBuffer.Forget();
+    program.Forget();
     unpack.Forget();
     pack.Forget();
     std::fill(mUnits.begin(), mUnits.end(), Unit{});
@@ -162,6 +167,10 @@ void GlState::ForgetFrameBuffer(GLuint frameBuffer) {
     if (!bound) return;
     if (bound->draw == frameBuffer) bound->draw = 0;
     if (bound->read == frameBuffer) bound->read = 0;
+}
+
+void GlState::TakeOffProgram(GLuint name) {
+    if (program.Get() == name) program.Set(0);
 }
 
 GlEditTexture::GlEditTexture(GlState& state, GLuint texture)

@@ -89,6 +89,12 @@ struct GlRenderBufferAccess {
     static void Apply(Value value, Value const* known);
 };
 
+struct GlProgramAccess {
+    using Value = GLuint;
+    static Value Query();
+    static void Apply(Value value, Value const* known);
+};
+
 class GlState {
 public:
     // Reads the number of texture units from the current context.
@@ -105,6 +111,7 @@ public:
     GlShadow<GlObstaclesAccess> obstacles;
     GlShadow<GlActiveUnitAccess> activeUnit;
     GlShadow<GlRenderBufferAccess> renderBuffer;
+    GlShadow<GlProgramAccess> program;
     GlShadow<GlPixelStoreAccess<GlUnpackNames>> unpack;
     GlShadow<GlPixelStoreAccess<GlPackNames>> pack;
 
@@ -120,6 +127,8 @@ public:
     void ForgetTexture(GLuint texture);
     void ForgetSampler(GLuint sampler);
     void ForgetFrameBuffer(GLuint frameBuffer);
+    // Ahead of its deletion, which a current program survives.
+    void TakeOffProgram(GLuint name);
 
 private:
     friend class GlEditTexture;

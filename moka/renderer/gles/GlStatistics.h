@@ -17,6 +17,7 @@ struct GlStatistics {
     std::atomic<int> renderTargets{0};
     std::atomic<int> textureObjects{0};
     std::atomic<int> depthStencilBuffers{0};
+    std::atomic<int> programs{0};
 
     std::atomic<std::uint64_t> frameBufferSwitches{0};
     std::atomic<std::uint64_t> clears{0};
@@ -35,6 +36,7 @@ struct GlStatistics {
         result.renderTargets = renderTargets;
         result.textureObjects = textureObjects;
         result.depthStencilBuffers = depthStencilBuffers;
+        result.programs = programs;
         result.frameBufferSwitches = frameBufferSwitches;
         result.clears = clears;
         result.copies = copies;

@@ -1,6 +1,7 @@
 // GlTables.h: the renderer's numbers and what they are in GL. GL_NONE stands for "names nothing".
 #pragma once
 
+#include "moka/renderer/IParameterBinding.h"
 #include "moka/renderer/TextureDescriptor.h"
 #include "moka/renderer/TextureParameter.h"
 
@@ -51,6 +52,28 @@ constexpr GLenum ToGlParameterValue(int id, int value) {
     if (value < 0 || value > 3) return GL_NONE;
     if (!isFilter) return ToGlWrap(static_cast<TextureParamWrappingValue>(value));
     return value > 1 ? GL_NONE : ToGlFilter(static_cast<TextureParamFilteringValue>(value));
+}
+
+// Unknown for the types that no parameter has.
+constexpr BindingType ToBindingType(GLenum uniformType) {
+    switch (uniformType) {
+    case GL_BOOL:
+        return BindingTypeBool;
+    case GL_FLOAT_MAT4:
+        return BindingTypeMatrix4;
+    case GL_FLOAT_VEC2:
+        return BindingTypeVector2;
+    case GL_FLOAT_VEC4:
+        return BindingTypeVector4;
+    case GL_FLOAT:
+        return BindingTypeFloat;
+    case GL_INT:
+        return BindingTypeInt;
+    case GL_SAMPLER_2D:
+        return BindingTypeTextureUnit;
+    default:
+        return BindingTypeUnknown;
+    }
 }
 
 // The one format there is; every size in bytes and every transfer in this folder relies on it.

@@ -6,6 +6,7 @@
 #include "moka/renderer/gles/GlDepthStencil.h"
 #include "moka/renderer/gles/GlDeviceCaps.h"
 #include "moka/renderer/gles/GlFrameBuffer.h"
+#include "moka/renderer/gles/GlProgram.h"
 #include "moka/renderer/gles/GlRenderTarget.h"
 #include "moka/renderer/gles/GlTables.h"
 #include "moka/renderer/gles/GlTexture.h"
@@ -168,6 +169,14 @@ IDepthStencilBuffer* RendererFactory::CreateDepthStencilBuffer(int width, int he
     if (!context || !IsSizeOk("CreateDepthStencilBuffer", width, height)) return nullptr;
     GlOperation const operation(*context);
     return GlDepthStencil::Create(context, width, height);
+}
+
+IShaderProgram* RendererFactory::CreateShaderProgram(char const* vertexSource, char const* fragmentSource,
+                                                     char const* name) {
+    std::shared_ptr<GlContext> const context = GetAttached("CreateShaderProgram");
+    if (!context) return new GlProgram(nullptr, vertexSource, fragmentSource, name);
+    GlOperation const operation(*context);
+    return new GlProgram(context, vertexSource, fragmentSource, name);
 }
 
 void RendererFactory::SetDeferred(bool on) {

@@ -82,8 +82,20 @@ RendererFixture::RendererFixture() {
 
 RendererFixture::~RendererFixture() { SetLogSink(nullptr); }
 
+namespace {
+
+// Holds the display open for the life of the process. A driver is unloaded with its last display, and what it had
+// not freed is then reported as leaked without a stack that tells whose it was.
+void KeepDriverLoaded(std::string* error) {
+    // Stored for real, so that the leak checker finds it.
+    [[gnu::used]] static detail::EglContext const* kept = detail::EglContext::Open({}, error).release();
+}
+
+} // namespace
+
 void RendererFixture::SetUp() {
     std::string error;
+    KeepDriverLoaded(&error);
     mEgl = detail::EglContext::Open({true, kSurfaceWidth, kSurfaceHeight}, &error);
     ASSERT_TRUE(mEgl) << error;
     ASSERT_TRUE(Attach());
@@ -99,6 +111,7 @@ void RendererFixture::TearDown() {
     EXPECT_EQ(left.renderTargets, 0);
     EXPECT_EQ(left.textureObjects, 0);
     EXPECT_EQ(left.depthStencilBuffers, 0);
+    EXPECT_EQ(left.programs, 0);
     EXPECT_EQ(left.errors, mKnownDriverErrors);
     RendererFactory::DetachContext();
     EXPECT_EQ(RendererFactory::GetStatistics().pooledRenderBuffers, 0);

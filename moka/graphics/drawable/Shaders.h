@@ -1,0 +1,105 @@
+// Shaders.h: the twelve programs that the library draws with. CMakeLists.txt here says which GLSL files each
+// is made of; the files say what a vertex is. Every vertex stage maps pixels of the canvas by its projection.
+// Colours come in as the paint has them and leave premultiplied. The flags are ints: 1 is on.
+#pragma once
+
+#include "moka/graphics/drawable/ShaderClass.h"
+
+namespace Moka {
+
+#define MOKA_COLOR_UNIFORMS(U)                                                                               \
+    U(Matrix4, uProjectionMatrix)                                                                            \
+    U(Vector4, uColor)                                                                                       \
+    U(Vector4, uTintColor)                                                                                   \
+    U(Int, uHasTintColor)
+
+// One colour under the coverage that the vertices carry.
+MOKA_SHADER_CLASS(MKRectShader, MOKA_COLOR_UNIFORMS)
+// The straight parts of a rounded rectangle.
+MOKA_SHADER_CLASS(MKRoundRectShader, MOKA_COLOR_UNIFORMS)
+
+// A corner of a rounded rectangle: part of an ellipse, filled or stroked.
+#define MOKA_ROUND_RECT_ROUND_UNIFORMS(U)                                                                    \
+    MOKA_COLOR_UNIFORMS(U)                                                                                   \
+    U(Int, uIsFill)                                                                                          \
+    U(Float, uStrokeWidth)                                                                                   \
+    U(Vector2, uRxry)
+MOKA_SHADER_CLASS(MKRoundRectRoundShader, MOKA_ROUND_RECT_ROUND_UNIFORMS)
+
+#define MOKA_CIRCLE_UNIFORMS(U)                                                                              \
+    MOKA_COLOR_UNIFORMS(U)                                                                                   \
+    U(Int, uIsFill)                                                                                          \
+    U(Float, uStrokeWidth)                                                                                   \
+    U(Vector2, uCenter)                                                                                      \
+    U(Float, uRadius)
+MOKA_SHADER_CLASS(MKCircleShader, MOKA_CIRCLE_UNIFORMS)
+
+// A segment with caps and dashes. uLineInfo is half the width and the length; uDashedLinePattern says where
+// each of dash, gap, dash, gap ends.
+#define MOKA_LINE_UNIFORMS(U)                                                                                \
+    MOKA_COLOR_UNIFORMS(U)                                                                                   \
+    U(Vector2, uLineInfo)                                                                                    \
+    U(Int, uIsDashedLine)                                                                                    \
+    U(Vector4, uDashedLinePattern)                                                                           \
+    U(Float, uDashedLinePatternLength)                                                                       \
+    U(Int, uLineCapType)
+MOKA_SHADER_CLASS(MKLineShader, MOKA_LINE_UNIFORMS)
+
+#define MOKA_BITMAP_UNIFORMS(U)                                                                              \
+    U(Matrix4, uProjectionMatrix)                                                                            \
+    U(TextureUnit, uSrcTexture)                                                                              \
+    U(Vector4, uColor)                                                                                       \
+    U(Vector4, uTintColor)                                                                                   \
+    U(Int, uHasTintColor)
+MOKA_SHADER_CLASS(MKBitmapShader, MOKA_BITMAP_UNIFORMS)
+// For a GPU that lets colours exceed alpha.
+MOKA_SHADER_CLASS(MKBitmapShaderColorClamp, MOKA_BITMAP_UNIFORMS)
+
+// Composes with a copy of the destination: uBlendingMode 1 darkens, 2 lightens.
+#define MOKA_BITMAP_ADVANCED_BLENDING_UNIFORMS(U)                                                            \
+    U(Matrix4, uProjectionMatrix)                                                                            \
+    U(TextureUnit, uSrcTexture)                                                                              \
+    U(TextureUnit, uDstTexture)                                                                              \
+    U(Vector4, uColor)                                                                                       \
+    U(Vector4, uTintColor)                                                                                   \
+    U(Vector2, uDstTextureSize)                                                                              \
+    U(Int, uHasTintColor)                                                                                    \
+    U(Int, uBlendingMode)
+MOKA_SHADER_CLASS(MKBitmapAdvancedBlendingShader, MOKA_BITMAP_ADVANCED_BLENDING_UNIFORMS)
+
+// The mix of two bitmaps; the colours are set without effect.
+#define MOKA_BLENDER_BITMAPS_UNIFORMS(U)                                                                     \
+    U(Matrix4, uProjectionMatrix)                                                                            \
+    U(TextureUnit, uSrcTexture1)                                                                             \
+    U(TextureUnit, uSrcTexture2)                                                                             \
+    U(Float, uFactor)                                                                                        \
+    U(Vector4, uColor)                                                                                       \
+    U(Vector4, uTintColor)                                                                                   \
+    U(Int, uHasTintColor)
+MOKA_SHADER_CLASS(MKBlenderBitmapsShader, MOKA_BLENDER_BITMAPS_UNIFORMS)
+
+// A bitmap's alpha in one colour.
+#define MOKA_TEXT_MASK_BITMAP_UNIFORMS(U)                                                                    \
+    U(Matrix4, uProjectionMatrix)                                                                            \
+    U(TextureUnit, uSrcTexture)                                                                              \
+    U(Vector4, uMaskColor)
+MOKA_SHADER_CLASS(MKTextMaskBitmapShader, MOKA_TEXT_MASK_BITMAP_UNIFORMS)
+
+// One bitmap over another, leaving not premultiplied.
+#define MOKA_NON_PREMULTIPLIED_COLOR_UNIFORMS(U)                                                             \
+    U(Matrix4, projectionMatrix)                                                                             \
+    U(TextureUnit, srcTexture)                                                                               \
+    U(TextureUnit, dstTexture)
+MOKA_SHADER_CLASS(MKNonPremultipliedColorShader, MOKA_NON_PREMULTIPLIED_COLOR_UNIFORMS)
+
+// One direction of a blur.
+#define MOKA_GAUSSIAN_BLUR_UNIFORMS(U)                                                                       \
+    U(Matrix4, projectionMatrix)                                                                             \
+    U(TextureUnit, srcTexture)                                                                               \
+    U(Vector4, uTintColor)                                                                                   \
+    U(Int, uHasTintColor)                                                                                    \
+    U(Bool, isHorizontal)                                                                                    \
+    U(Float, blurAmount)
+MOKA_SHADER_CLASS(MKGaussianBlurShader, MOKA_GAUSSIAN_BLUR_UNIFORMS)
+
+} // namespace Moka

@@ -1,0 +1,21 @@
+#version 100
+precision mediump float;
+
+uniform sampler2D uSrcTexture;
+uniform vec4 uColor;
+uniform vec4 uTintColor;
+uniform int uHasTintColor;
+
+varying float alphaAA;
+varying vec2 vUV;
+
+void main() {
+    vec4 texel = texture2D(uSrcTexture, vUV);
+    float a = alphaAA * uColor.a;
+    if (uHasTintColor == 1) {
+        a *= uTintColor.a * texel.a;
+        gl_FragColor = vec4(uTintColor.rgb * a, a);
+    } else {
+        gl_FragColor = texel * a;
+    }
+}

@@ -1,0 +1,17 @@
+#version 100
+precision mediump float;
+
+uniform sampler2D uSrcTexture1;
+uniform sampler2D uSrcTexture2;
+uniform float uFactor;
+// Set by whoever draws, and without effect here.
+uniform vec4 uColor;
+uniform vec4 uTintColor;
+uniform int uHasTintColor;
+
+varying float alphaAA;
+varying vec2 vUV;
+
+void main() {
+    gl_FragColor = mix(texture2D(uSrcTexture1, vUV), texture2D(uSrcTexture2, vUV), uFactor);
+}

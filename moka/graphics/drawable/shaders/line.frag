@@ -1,0 +1,109 @@
+#version 100
+precision mediump float;
+
+uniform vec4 uColor;
+uniform vec4 uTintColor;
+uniform int uHasTintColor;
+uniform vec2 uLineInfo; // half the width, the length
+uniform int uIsDashedLine;
+uniform vec4 uDashedLinePattern; // where dash, gap, dash, gap end
+uniform float uDashedLinePatternLength;
+uniform int uLineCapType; // 0 butt, 1 round, else square
+
+varying vec2 vLineCoord;
+
+// An edge that does not exist on its side.
+const float kNowhere = 100000.0;
+
+// Whether x lies in [low, high].
+bool within(float x, float low, float high) {
+    return low <= x && x <= high;
+}
+
+// A stretch along the line: a dash, when inside, or what lies between the end of one and the begin of the
+// next.
+struct Stretch {
+    float x; // where in it the fragment lies; of a dashed line the place in the pattern
+    float left;
+    float right;
+    bool inside;
+};
+
+Stretch solid(float x, float lineLength) {
+    if (x < 0.0) return Stretch(x, -kNowhere, 0.0, false);
+    if (x > lineLength) return Stretch(x, lineLength, kNowhere, false);
+    return Stretch(x, 0.0, lineLength, true);
+}
+
+Stretch dashed(float x, float halfWidth, float lineLength) {
+    vec4 p = uDashedLinePattern;
+    float rest = mod(lineLength, uDashedLinePatternLength); // where in the pattern the line ends
+    float cx = mod(x, uDashedLinePatternLength);
+    if (x >= lineLength) {
+        if (within(rest, 0.0, p.x) || within(rest, p.y, p.z)) return Stretch(x, lineLength, kNowhere, false);
+        return Stretch(cx, rest < p.y ? p.x : p.z, kNowhere, false);
+    }
+    Stretch s = Stretch(cx, p.z, p.w, false);
+    if (cx < p.x) {
+        s = Stretch(cx, 0.0, p.x, true);
+    } else if (cx < p.y) {
+        s = Stretch(cx, p.x, p.y, false);
+    } else if (cx < p.z) {
+        s = Stretch(cx, p.y, p.z, true);
+    }
+    // A line that ends in a gap has no next dash whose cap could reach back.
+    bool endsInGap = within(rest, p.x, p.y) || within(rest, p.z, p.w);
+    if (x >= lineLength - halfWidth - 0.5 && !s.inside && endsInGap) s.right = kNowhere;
+    return s;
+}
+
+float alongInside(Stretch s) {
+    if (uLineCapType != 0) return 1.0;
+    if (s.x < s.left + 0.5) return max(0.5 + s.x - s.left, 0.0);
+    if (s.x > s.right - 0.5) return max(0.5 + s.right - s.x, 0.0);
+    return 1.0;
+}
+
+// The caps of the dashes on both sides.
+float alongOutside(Stretch s, float y, float halfWidth) {
+    float left;
+    float right;
+    if (uLineCapType == 0) {
+        left = max(0.5 + s.left - s.x, 0.0);
+        right = max(0.5 + s.x - s.right, 0.0);
+    } else if (uLineCapType == 1) {
+        left = clamp(0.5 + halfWidth - distance(vec2(s.x, y), vec2(s.left, 0.0)), 0.0, 1.0);
+        right = clamp(0.5 + halfWidth - distance(vec2(s.x, y), vec2(s.right, 0.0)), 0.0, 1.0);
+    } else {
+        left = clamp(0.5 + (s.left + halfWidth) - s.x, 0.0, 1.0);
+        right = clamp(0.5 + s.x - (s.right - halfWidth), 0.0, 1.0);
+    }
+    return max(left, right);
+}
+
+float across(float y, float halfWidth) {
+    if (y > halfWidth - 0.5) return clamp(0.5 + halfWidth - y, 0.0, 1.0);
+    if (y < -halfWidth + 0.5) return clamp(0.5 + halfWidth + y, 0.0, 1.0);
+    return 1.0;
+}
+
+void main() {
+    float y = vLineCoord.y;
+    float halfWidth = uLineInfo.x;
+    float lineLength = uLineInfo.y;
+    Stretch s;
+    if (uIsDashedLine == 1) {
+        s = dashed(vLineCoord.x, halfWidth, lineLength);
+    } else {
+        s = solid(vLineCoord.x, lineLength);
+    }
+    float along = s.inside ? alongInside(s) : alongOutside(s, y, halfWidth);
+
+    float alpha = min(along, across(y, halfWidth)) * uColor.a;
+    vec3 color = uColor.rgb;
+    if (uHasTintColor == 1) {
+        alpha *= uTintColor.a;
+        color = uTintColor.rgb;
+    }
+    gl_FragColor = vec4(color * alpha, alpha);
+}

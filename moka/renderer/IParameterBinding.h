@@ -1,0 +1,41 @@
+// IParameterBinding: a handle on one uniform of a program: sets its value, knows its type.
+// Owner:   whoever looked it up; deleting it is the release. It may outlive its program, and then does
+//          nothing.
+// Thread:  render thread.
+// Types:   the handle converts from the type it reports: a bool is one byte, an int or a texture unit an int,
+//          a vector or a matrix its packed floats (matrices column-major).
+// Set stands first and the destructor right behind it; those places are part of the contract.
+#pragma once
+
+namespace Moka {
+
+// The numbers are the interface.
+enum BindingType {
+    BindingTypeUnknown = 0, // nothing of that name, or the compiler removed it: setting does nothing
+    BindingTypeBool = 1,
+    BindingTypeMatrix4 = 2,
+    BindingTypeVector2 = 3,
+    BindingTypeVector4 = 5,
+    BindingTypeFloat = 6,
+    BindingTypeInt = 7,
+    BindingTypeTextureUnit = 8,
+};
+
+class IParameterBinding {
+public:
+    // value points to one value of the type; it is copied. Uniforms belong to their program: what is set
+    // while another one is current is in force once this one is. A value equal to the last one costs no call
+    // of the driver.
+    virtual void Set(void const* value) = 0;
+    virtual ~IParameterBinding() = default;
+
+    BindingType const& GetType() const { return mType; }
+
+protected:
+    explicit IParameterBinding(BindingType type) : mType(type) {}
+
+private:
+    BindingType const mType;
+};
+
+} // namespace Moka

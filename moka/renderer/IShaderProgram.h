@@ -1,0 +1,27 @@
+// IShaderProgram: a vertex and a fragment stage, compiled and linked. One whose sources do not compile is an
+// object like any other: it can be current, its parameters are of unknown type, and it draws nothing.
+// Owner:  whoever created it, until Release().
+// Thread: render thread.
+// The order of the operations is part of the contract.
+#pragma once
+
+namespace Moka {
+
+class IParameterBinding;
+
+class IShaderProgram {
+public:
+    // What is drawn from here on is drawn with it.
+    virtual void MakeCurrent() = 0;
+
+    virtual void Release() = 0;
+
+    // A new handle, which the caller owns. Never null: for a name that the linked program does not have, its
+    // type is BindingTypeUnknown. Arrays are not handed out.
+    virtual IParameterBinding* GetParameter(char const* name) = 0;
+
+protected:
+    ~IShaderProgram() = default;
+};
+
+} // namespace Moka

@@ -1,0 +1,17 @@
+// GlProgramBuilder.h: GLSL texts become a linked GL program.
+// Thread: render thread, inside an operation.
+#pragma once
+
+#include <GLES3/gl3.h>
+
+namespace Moka::detail {
+
+class GlContext;
+
+// Attributes get their locations in the order of their declaration. A pair that does not compile or link is
+// reported with one error line, and a program that draws nothing takes its place. 0 only when the driver
+// makes no program at all.
+GLuint BuildGlProgram(GlContext& context, char const* vertexSource, char const* fragmentSource,
+                      char const* name);
+
+} // namespace Moka::detail

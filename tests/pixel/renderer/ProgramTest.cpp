@@ -1,0 +1,325 @@
+// Programs and their parameters: what reaches the shader, what is not sent, and programs that are none.
+#include "tests/pixel/renderer/RawStrip.h"
+#include "tests/pixel/renderer/RendererFixture.h"
+
+#include "moka/renderer/IParameterBinding.h"
+#include "moka/renderer/IShaderProgram.h"
+
+#include <gmock/gmock.h>
+
+#include <cstring>
+
+namespace Moka::Testing {
+namespace {
+
+using ::testing::AllOf;
+using ::testing::ElementsAre;
+using ::testing::HasSubstr;
+using ProgramPtr = std::unique_ptr<IShaderProgram, Releaser>;
+using ParameterPtr = std::unique_ptr<IParameterBinding>;
+
+constexpr char kVertex[] = "attribute vec2 corner; void main() { gl_Position = vec4(corner, 0.0, 1.0); }";
+constexpr char kUniformColor[] =
+    "precision highp float; uniform vec4 color; void main() { gl_FragColor = color; }";
+
+ProgramPtr MakeProgram(char const* vertex, char const* fragment, char const* name = "TestProgram") {
+    return ProgramPtr(RendererFactory::CreateShaderProgram(vertex, fragment, name));
+}
+
+ParameterPtr Find(ProgramPtr const& program, char const* name) {
+    return ParameterPtr(program->GetParameter(name));
+}
+
+template <class T>
+void Set(ParameterPtr const& parameter, T const& value) {
+    parameter->Set(&value);
+}
+
+using Numbers = std::vector<float>;
+void Set(ParameterPtr const& parameter, Numbers const& values) { parameter->Set(values.data()); }
+
+// The GL name.
+GLuint MakeCurrent(ProgramPtr const& program) {
+    program->MakeCurrent();
+    return static_cast<GLuint>(GetInteger(GL_CURRENT_PROGRAM));
+}
+
+void DrawEverywhere() { DrawRawStrip({{2, {-1, -1, 1, -1, -1, 1, 1, 1}}}); }
+
+class ProgramTest : public RendererFixture {
+protected:
+    void SetUp() override {
+        RendererFixture::SetUp();
+        mTexture = MakeTexture(2, 2);
+        target = MakeTarget(*mTexture);
+        target->Activate();
+    }
+    void TearDown() override {
+        target.reset();
+        mTexture.reset();
+        RendererFixture::TearDown();
+    }
+
+    // What the current program draws over the whole target.
+    Pixel Draw() {
+        Clear(*target, kClear);
+        DrawEverywhere();
+        Image const image = Read(*target, 2, 2);
+        EXPECT_EQ(image, Image(2, 2, image.At(0, 0)));
+        return image.At(0, 0);
+    }
+
+    TargetPtr target;
+
+private:
+    TexturePtr mTexture;
+};
+
+TEST_F(ProgramTest, AttributesTakeTheirLocationsInTheOrderOfTheText) {
+    ProgramPtr const program =
+        MakeProgram("attribute vec2 zulu; // attribute float none;\n"
+                    "attribute mat3 matrix; attribute highp float mike, alpha;"
+                    "void main() { gl_Position = vec4(zulu, mike, alpha) + matrix[2].xyzx; }",
+                    "void main() { gl_FragColor = vec4(1.0); }");
+    GLuint const name = MakeCurrent(program);
+    EXPECT_EQ(glGetAttribLocation(name, "zulu"), 0);
+    EXPECT_EQ(glGetAttribLocation(name, "matrix"), 1);
+    EXPECT_EQ(glGetAttribLocation(name, "mike"), 4);
+    EXPECT_EQ(glGetAttribLocation(name, "alpha"), 5);
+}
+
+TEST_F(ProgramTest, EveryTypeIsReportedAndArrivesWhole) {
+    ProgramPtr const program =
+        MakeProgram("#version 300 es\n"
+                    "in vec2 corner; uniform mat4 matrix; uniform int count;\n"
+                    "out highp vec4 column;\n"
+                    "void main() { column = matrix[2]; gl_Position = vec4(corner, 0, 1); }",
+                    "#version 300 es\n"
+                    "precision highp float; uniform bool flag; uniform highp int count;\n"
+                    "uniform vec2 pair; uniform vec4 quad; uniform float number;\n"
+                    "uniform sampler2D texel; in highp vec4 column; out vec4 color;\n"
+                    "void main() {\n"
+                    "  if (count == 0) color = column;\n"
+                    "  else if (count == -7) color = vec4(pair, number, flag ? 1.0 : 0.0);\n"
+                    "  else if (count == 2) color = quad;\n"
+                    "  else color = texture(texel, vec2(0.5));\n"
+                    "}");
+    ParameterPtr const flag = Find(program, "flag");
+    ParameterPtr const matrix = Find(program, "matrix");
+    ParameterPtr const pair = Find(program, "pair");
+    ParameterPtr const quad = Find(program, "quad");
+    ParameterPtr const number = Find(program, "number");
+    ParameterPtr const count = Find(program, "count");
+    ParameterPtr const texel = Find(program, "texel");
+    EXPECT_EQ(flag->GetType(), 1);
+    EXPECT_EQ(matrix->GetType(), 2);
+    EXPECT_EQ(pair->GetType(), 3);
+    EXPECT_EQ(quad->GetType(), 5);
+    EXPECT_EQ(number->GetType(), 6);
+    EXPECT_EQ(count->GetType(), 7);
+    EXPECT_EQ(texel->GetType(), 8);
+
+    program->MakeCurrent();
+    // Column-major: the third column.
+    Set(matrix, Numbers{9, 9, 9, 9, 9, 9, 9, 9, 1, 0, 0.2f, 1, 9, 9, 9, 9});
+    EXPECT_EQ(Draw(), (Pixel{255, 0, 51, 255}));
+    Set(count, -7);
+    Set(pair, Numbers{0.2f, 1});
+    Set(number, 0.6f);
+    // A bool is one byte; the ones behind it are somebody else's.
+    struct {
+        bool value = true;
+        unsigned char strangers[3] = {0xFF, 0xFF, 0xFF};
+    } bools;
+    flag->Set(&bools.value);
+    EXPECT_EQ(Draw(), (Pixel{51, 255, 153, 255}));
+    bools.value = false;
+    flag->Set(&bools.value);
+    EXPECT_EQ(Draw(), (Pixel{51, 255, 153, 0}));
+    Set(count, 2);
+    Set(quad, Numbers{1, 0.8f, 0.4f, 0.2f});
+    EXPECT_EQ(Draw(), (Pixel{255, 204, 102, 51}));
+    Set(count, 3);
+    TexturePtr const green = MakeTexture(Image(1, 1, kGreen));
+    TexturePtr const blue = MakeTexture(Image(1, 1, kBlue));
+    green->Bind(0);
+    blue->Bind(3);
+    EXPECT_EQ(Draw(), kGreen);
+    Set(texel, 3);
+    EXPECT_EQ(Draw(), kBlue);
+}
+
+TEST_F(ProgramTest, RemovedAndUnknownParametersAreHarmlessHandles) {
+    ProgramPtr const program =
+        MakeProgram(kVertex, "precision highp float; uniform vec4 color; uniform mat4 unused;"
+                             "void main() { gl_FragColor = color; }");
+    program->MakeCurrent();
+    Set(Find(program, "color"), Numbers{0, 1, 0, 1});
+    for (char const* name : {"unused", "nowhere", "", "corner"}) {
+        ParameterPtr const parameter = Find(program, name);
+        ASSERT_TRUE(parameter) << name;
+        EXPECT_EQ(parameter->GetType(), BindingTypeUnknown) << name;
+        Set(parameter, Numbers(16, 1.0f));
+        parameter->Set(nullptr);
+    }
+    EXPECT_TRUE(Find(program, nullptr));
+    EXPECT_EQ(Draw(), kGreen);
+}
+
+TEST_F(ProgramTest, AUniformOfATypeThatNoHandleHasIsReported) {
+    ProgramPtr const program =
+        MakeProgram(kVertex, "precision highp float; uniform vec3 tint; uniform vec4 list[2];"
+                             "void main() { gl_FragColor = vec4(tint, 1.0) + list[1]; }");
+    EXPECT_THAT(TakeErrors(),
+                ::testing::UnorderedElementsAre(AllOf(HasSubstr("TestProgram"), HasSubstr("tint")),
+                                                AllOf(HasSubstr("TestProgram"), HasSubstr("list"))));
+    EXPECT_EQ(Find(program, "tint")->GetType(), BindingTypeUnknown);
+    EXPECT_EQ(Find(program, "list")->GetType(), BindingTypeUnknown);
+}
+
+TEST_F(ProgramTest, AValueIsSentOnceWhicheverHandleSetsIt) {
+    ProgramPtr const program = MakeProgram(kVertex, kUniformColor);
+    GLuint const name = MakeCurrent(program);
+    GLint const location = glGetUniformLocation(name, "color");
+    ParameterPtr const first = Find(program, "color");
+    ParameterPtr const second = Find(program, "color");
+    auto const valueInGl = [&] {
+        GLfloat value[4] = {};
+        glGetUniformfv(name, location, value);
+        return value[0];
+    };
+    glUniform4f(location, 0.25f, 0, 0, 0); // shows who overwrites it
+    Set(first, Numbers{0, 0, 0, 0});       // what it is from the beginning
+    EXPECT_EQ(valueInGl(), 0.25f);
+    Set(first, Numbers{1, 0, 0, 1});
+    EXPECT_EQ(valueInGl(), 1.0f);
+    glUniform4f(location, 0.25f, 0, 0, 0);
+    Set(second, Numbers{1, 0, 0, 1});
+    EXPECT_EQ(valueInGl(), 0.25f);
+    Set(second, Numbers{1, 0, 0, 0});
+    EXPECT_EQ(valueInGl(), 1.0f);
+    Set(first, Numbers{1, 0, 0, 1});
+    EXPECT_EQ(Draw(), kRed);
+}
+
+TEST_F(ProgramTest, ValuesBelongToTheirProgramWhicheverIsCurrent) {
+    ProgramPtr const one = MakeProgram(kVertex, kUniformColor);
+    ProgramPtr const other = MakeProgram(kVertex, kUniformColor);
+    ParameterPtr const oneColor = Find(one, "color");
+    ParameterPtr const otherColor = Find(other, "color");
+    Set(oneColor, Numbers{1, 0, 0, 1}); // before any is current
+    other->MakeCurrent();
+    Set(oneColor, Numbers{0, 0, 1, 1});
+    Set(otherColor, Numbers{0, 1, 0, 1});
+    EXPECT_EQ(Draw(), kGreen);
+    one->MakeCurrent();
+    EXPECT_EQ(Draw(), kBlue);
+
+    // A program that foreign code has made current in between is noticed.
+    for (bool deferred : {false, true}) {
+        RendererFactory::SetDeferred(deferred);
+        RendererFactory::Flush();
+        glUseProgram(MakeCurrent(other));
+        RendererFactory::InvalidateState();
+        Set(oneColor, Numbers{1, 0, 0, deferred ? 1.0f : 0.0f});
+        EXPECT_EQ(Draw(), kGreen);
+        one->MakeCurrent();
+        EXPECT_EQ(Draw(), (Pixel{255, 0, 0, static_cast<std::uint8_t>(deferred ? 255 : 0)}));
+    }
+}
+
+TEST_F(ProgramTest, TheCurrentProgramIsMadeCurrentAgainOnlyAfterForeignGl) {
+    ProgramPtr const program = MakeProgram(kVertex, kUniformColor);
+    GLuint const name = MakeCurrent(program);
+    glUseProgram(0);
+    program->MakeCurrent();
+    EXPECT_EQ(GetInteger(GL_CURRENT_PROGRAM), 0);
+    RendererFactory::InvalidateState();
+    program->MakeCurrent();
+    EXPECT_EQ(GetInteger(GL_CURRENT_PROGRAM), static_cast<GLint>(name));
+    // Without an active target the host may have called GL at any time.
+    target->Deactivate(false, false);
+    glUseProgram(0);
+    program->MakeCurrent();
+    EXPECT_EQ(GetInteger(GL_CURRENT_PROGRAM), static_cast<GLint>(name));
+}
+
+TEST_F(ProgramTest, SourcesThatDoNotCompileOrLinkMakeAProgramThatDrawsNothing) {
+    struct {
+        char const* vertex;
+        char const* fragment;
+        char const* stage;
+    } const cases[] = {
+        {"attribute vec2 corner; void main() { gl_Position = misspelt; }", kUniformColor, "vertex"},
+        {kVertex, "uniform vec4 color; void main() { gl_FragColor = misspelt; }", "fragment"},
+        {kVertex, "precision highp float; varying vec4 misspelt; void main() { gl_FragColor = misspelt; }",
+         "link"},
+        {"", kUniformColor, ""},
+        {nullptr, nullptr, ""},
+        {"uniform vec4 misspelt;", "{", ""},
+    };
+    for (auto const& [vertex, fragment, stage] : cases) {
+        std::uint64_t const errors = RendererFactory::GetStatistics().errors;
+        ProgramPtr const program = MakeProgram(vertex, fragment, "BrokenProgram");
+        ASSERT_TRUE(program);
+        std::vector<std::string> const lines = TakeErrors();
+        ASSERT_EQ(lines.size(), 1u) << stage;
+        EXPECT_THAT(lines[0], AllOf(HasSubstr("BrokenProgram"), HasSubstr(stage)));
+        if (*stage) {
+            EXPECT_THAT(lines[0], HasSubstr("misspelt"));
+        } // the driver's own words
+        EXPECT_EQ(RendererFactory::GetStatistics().errors, errors + 1);
+        EXPECT_EQ(RendererFactory::GetStatistics().programs, 1);
+        ParameterPtr const color = Find(program, "color");
+        EXPECT_EQ(color->GetType(), BindingTypeUnknown);
+        program->MakeCurrent();
+        Set(color, Numbers{1, 1, 1, 1});
+        EXPECT_EQ(Draw(), kClear) << stage;
+    }
+    ForgetDriverErrors();
+}
+
+TEST_F(ProgramTest, ReleaseDeletesTheProgramAndItsHandlesLiveOnInert) {
+    ProgramPtr program = MakeProgram(kVertex, kUniformColor);
+    ProgramPtr idle = MakeProgram(kVertex, kUniformColor);
+    GLuint const idleName = MakeCurrent(idle);
+    GLuint const name = MakeCurrent(program);
+    ParameterPtr const color = Find(program, "color");
+    EXPECT_EQ(RendererFactory::GetStatistics().programs, 2);
+    program.reset();
+    idle.reset();
+    EXPECT_FALSE(glIsProgram(name));
+    EXPECT_FALSE(glIsProgram(idleName));
+    EXPECT_EQ(RendererFactory::GetStatistics().programs, 0);
+    ProgramPtr const next = MakeProgram(kVertex, kUniformColor); // often of the same name
+    next->MakeCurrent();
+    Set(color, Numbers{1, 0, 0, 1});
+    EXPECT_EQ(color->GetType(), BindingTypeVector4);
+    EXPECT_EQ(Draw(), kClear);
+}
+
+TEST_F(ProgramTest, WithoutItsContextAProgramIsInert) {
+    ProgramPtr program = MakeProgram(kVertex, kUniformColor);
+    ParameterPtr const color = Find(program, "color");
+    RendererFactory::DetachContext();
+    ProgramPtr const homeless = MakeProgram(kVertex, kUniformColor);
+    ASSERT_TRUE(homeless);
+    EXPECT_EQ(TakeErrors().size(), 1u);
+    RestartEgl();
+    ASSERT_TRUE(Attach());
+    ProgramPtr const stranger = MakeProgram(kVertex, kUniformColor);
+    GLuint const name = MakeCurrent(stranger);
+    for (IShaderProgram* const old : {program.get(), homeless.get()}) {
+        old->MakeCurrent();
+        Set(color, Numbers{1, 0, 0, 1});
+        Set(ParameterPtr(old->GetParameter("color")), Numbers{1, 0, 0, 1});
+    }
+    EXPECT_EQ(Find(homeless, "color")->GetType(), BindingTypeUnknown);
+    program.reset();
+    EXPECT_TRUE(glIsProgram(name));
+    EXPECT_EQ(GetInteger(GL_CURRENT_PROGRAM), static_cast<GLint>(name));
+    EXPECT_EQ(RendererFactory::GetStatistics().programs, 1);
+}
+
+} // namespace
+} // namespace Moka::Testing

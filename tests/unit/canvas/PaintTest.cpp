@@ -1,0 +1,89 @@
+#include "moka/graphics/canvas/MKPaint.h"
+
+#include <gtest/gtest.h>
+
+namespace Moka::Testing {
+namespace {
+
+using Color = Vector4<float>;
+
+TEST(PaintTest, ANewPaintIsOpaqueWhiteFilledAndPlain) {
+    MKPaint const paint;
+    EXPECT_EQ(paint.GetColor(), Color(1, 1, 1, 1));
+    EXPECT_EQ(paint.GetTintColor(), Color(0, 0, 0, 0));
+    EXPECT_FALSE(paint.HasTintColor());
+    EXPECT_EQ(paint.GetXFermode(), 12);
+    EXPECT_EQ(paint.GetStyle(), 0);
+    EXPECT_EQ(paint.GetLineWidth(), 1.0f);
+    EXPECT_FALSE(paint.IsAntiAliasing());
+    EXPECT_EQ(paint.GetDashedLinePattern(), Color(-1, -1, -1, -1));
+    EXPECT_EQ(paint.GetLineCapType(), 0);
+    EXPECT_EQ(paint.GetTileModeX(), 0);
+    EXPECT_EQ(paint.GetTileModeY(), 0);
+}
+
+TEST(PaintTest, ColoursUnpackFromArgbAndThreeComponentsKeepTheAlpha) {
+    MKPaint paint;
+    paint.SetColor(static_cast<int>(0x80FF0000u));
+    EXPECT_EQ(paint.GetColor(), Color(1, 0, 0, 128.0f / 255.0f));
+    paint.SetColor(0x01020304);
+    EXPECT_EQ(paint.GetColor(), Color(2.0f / 255, 3.0f / 255, 4.0f / 255, 1.0f / 255));
+    paint.SetColor(0.2f, 0.3f, 0.4f);
+    EXPECT_EQ(paint.GetColor(), Color(0.2f, 0.3f, 0.4f, 1.0f / 255));
+    paint.SetAlpha(0.5f);
+    EXPECT_EQ(paint.GetColor(), Color(0.2f, 0.3f, 0.4f, 0.5f));
+    paint.SetColor(2.0f, -1.0f, 0.0f, 7.0f); // stored as given
+    EXPECT_EQ(paint.GetColor(), Color(2, -1, 0, 7));
+    EXPECT_EQ(paint.GetAlpha(), 7.0f);
+}
+
+TEST(PaintTest, EveryTintSetsTheFlagAndClearingTakesBothAway) {
+    MKPaint paint;
+    paint.SetTintColor(0x11223344);
+    EXPECT_TRUE(paint.HasTintColor());
+    EXPECT_EQ(paint.GetTintColor(), Color(0x22 / 255.0f, 0x33 / 255.0f, 0x44 / 255.0f, 0x11 / 255.0f));
+    EXPECT_EQ(paint.GetColor(), Color(1, 1, 1, 1));
+    paint.ClearTintColor();
+    EXPECT_FALSE(paint.HasTintColor());
+    EXPECT_EQ(paint.GetTintColor(), Color());
+    paint.SetTintColor(0, 0, 0, 0);
+    EXPECT_TRUE(paint.HasTintColor());
+}
+
+TEST(PaintTest, TwoDashLengthsStandForFourAndOneTileModeForBothAxes) {
+    MKPaint paint;
+    paint.SetDashedLinePattern(Vector2<float>(4, 2));
+    EXPECT_EQ(paint.GetDashedLinePattern(), Color(4, 2, 4, 2));
+    paint.SetDashedLinePattern(Color(1, 2, 3, 4));
+    EXPECT_EQ(paint.GetDashedLinePattern(), Color(1, 2, 3, 4));
+    paint.ClearDashedLinePattern();
+    EXPECT_EQ(paint.GetDashedLinePattern(), Color(-1, -1, -1, -1));
+
+    paint.SetTileMode(static_cast<MKPaint::TileMode>(2));
+    EXPECT_EQ(paint.GetTileModeX(), MKPaint::Mirror);
+    EXPECT_EQ(paint.GetTileModeY(), MKPaint::Mirror);
+    paint.SetTileMode(MKPaint::Clamp, MKPaint::Repeat);
+    EXPECT_EQ(paint.GetTileModeX(), 1);
+    EXPECT_EQ(paint.GetTileModeY(), 3);
+}
+
+TEST(PaintTest, ACopyIsIndependentAndKeepsNumbersThatHaveNoName) {
+    MKPaint paint;
+    paint.SetXFermode(static_cast<MKPaint::XFermode>(25));
+    paint.SetStyle(static_cast<MKPaint::Style>(-7));
+    paint.SetLineCapType(static_cast<MKPaint::LineCapType>(99));
+    paint.SetLineWidth(-3.5f);
+    paint.SetAntiAliasing(true);
+    MKPaint const copy = paint;
+    paint = MKPaint();
+    EXPECT_EQ(copy.GetXFermode(), 25);
+    EXPECT_EQ(copy.GetStyle(), -7);
+    EXPECT_EQ(copy.GetLineCapType(), 99);
+    EXPECT_EQ(copy.GetLineWidth(), -3.5f);
+    EXPECT_TRUE(copy.IsAntiAliasing());
+    EXPECT_EQ(paint.GetXFermode(), MKPaint::SrcOver);
+    EXPECT_FALSE(paint.IsAntiAliasing());
+}
+
+} // namespace
+} // namespace Moka::Testing

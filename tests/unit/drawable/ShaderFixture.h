@@ -1,0 +1,38 @@
+// ShaderFixture: shaders over the recording renderer, on the render thread. Every test ends with nothing
+// alive that was not before, and nothing misused.
+#pragma once
+
+#include "moka/base/log/AndroidLog.h"
+#include "moka/graphics/drawable/ShaderManager.h"
+#include "moka/graphics/drawable/Shaders.h"
+#include "tests/support/LogCapture.h"
+#include "tests/support/RecordingRenderer.h"
+
+#include <gmock/gmock.h>
+
+#include <string>
+#include <vector>
+
+namespace Moka::Testing {
+
+class ShaderFixture : public ::testing::Test {
+protected:
+    void SetUp() override {
+        RecordingRenderer::Reset();
+        ASSERT_TRUE(RendererFactory::AttachContext());
+        expectedAlive = RecordingRenderer::CountLiveObjects();
+    }
+
+    void TearDown() override {
+        EXPECT_EQ(RecordingRenderer::CountLiveObjects(), expectedAlive);
+        EXPECT_THAT(RecordingRenderer::GetViolations(), ::testing::IsEmpty());
+        RendererFactory::DetachContext();
+        RecordingRenderer::Reset();
+    }
+
+    ShaderManager& manager = *ShaderManager::GetInstance();
+    LogCapture log;
+    int expectedAlive = 0; // for the tests that leak on purpose
+};
+
+} // namespace Moka::Testing
