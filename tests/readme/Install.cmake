@@ -1,4 +1,4 @@
-# Installs BUILD into FOLDER, builds SOURCE with find_package(MokaGraphics), and runs it on PICTURE.
+# Installs BUILD into FOLDER, builds SOURCE with GENERATOR and find_package(MokaGraphics), and runs it on PICTURE.
 set(project ${FOLDER}/project)
 file(REMOVE_RECURSE ${FOLDER}/installed ${project})
 file(MAKE_DIRECTORY ${project})
@@ -16,6 +16,7 @@ macro(run)
   endif()
 endmacro()
 run(${CMAKE_COMMAND} --install ${BUILD} --prefix ${FOLDER}/installed)
-run(${CMAKE_COMMAND} -S ${project} -B ${project}/build -DCMAKE_PREFIX_PATH=${FOLDER}/installed)
+run(${CMAKE_COMMAND} -G ${GENERATOR} -S ${project} -B ${project}/build
+  -DCMAKE_PREFIX_PATH=${FOLDER}/installed)
 run(${CMAKE_COMMAND} --build ${project}/build)
 run(${project}/build/user ${PICTURE} ${project}/written.mki)
