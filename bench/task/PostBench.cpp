@@ -2,8 +2,7 @@
 // would write first, in the same run. Both take turns, so that they meet the same machine.
 // Time:     of TaskQueue, the mean over the bursts, for each post as its producer sees it.
 // Counters: the medians over the bursts, how many times faster TaskQueue is, and how often each consumer gave
-// up
-//           its core for each post (1 would be a wake-up for every task).
+//           up its core for each post (1 would be a wake-up for every task).
 #include "bench/task/Burst.h"
 #include "bench/task/PlainQueue.h"
 #include "moka/graphics/task/WorkerTask.h"

@@ -1,7 +1,8 @@
 // MessageLoop: runs the messages of the Handlers that one thread made.
 // Owner:  the thread that constructs it; at most one a thread, found with GetCurrent().
 // Thread: Run, RunPending and destruction on the owning thread; Quit and the posting side of Handler from
-// any. Fails:  an exception out of a message is one error line, and the loop goes on.
+//         any.
+// Fails:  an exception out of a message is one error line, and the loop goes on.
 #pragma once
 
 #include "moka/base/Export.h"

@@ -1,7 +1,8 @@
 // String: UTF-16 text, as the platform's Java side hands it over, with UTF-8 conversion both ways.
 // Default construction allocates nothing. Malformed input is kept going: a lone surrogate, and every
-// malformed UTF-8 sequence, becomes U+FFFD on conversion. Thread: a value type; not synchronised.
-// Fails: std::bad_alloc when memory is out, as the standard strings do.
+// malformed UTF-8 sequence, becomes U+FFFD on conversion.
+// Thread: a value type; not synchronised.
+// Fails:  std::bad_alloc when memory is out, as the standard strings do.
 #pragma once
 
 #include "moka/base/Export.h"

@@ -1,7 +1,6 @@
 // ImageCodec.h: the shape all codecs share. A codec is a constant table of functions without state.
 // Fails:  false and the reason, a phrase without the file's name; whatever was allocated is freed. A reason
-// left
-//         empty by encode means the file itself failed and knows why.
+//         left empty by encode means the file itself failed and knows why.
 // Order:  every codec checks the size a file claims with CheckSize before it allocates by it.
 #pragma once
 

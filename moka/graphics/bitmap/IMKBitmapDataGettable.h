@@ -1,13 +1,11 @@
 // IMKBitmapDataGettable: reads pixels back from the GPU.
 // Units:  pixels of the whole bitmap, origin top left. A pixel is RGBA bytes in memory, premultiplied: opaque
-// red
-//         reads 0xFF0000FF. Data is packed for the whole of the rectangle asked for: its width times four
+//         red reads 0xFF0000FF. Data is packed for the whole of the rectangle asked for: its width times four
 //         bytes a row; what lies outside the bitmap is left untouched.
 // Thread: caller-side bitmaps from any thread but the render thread, which the blocking forms would wait for;
 //         render-thread bitmaps on the render thread, where nothing blocks.
 // Fails:  reads of nothing give 0, or leave the destination as it was; an asynchronous form of a strip still
-// calls
-//         back. A read that the queue refuses never calls back.
+//         calls back. A read that the queue refuses never calls back.
 #pragma once
 
 #include "moka/base/Point.h"

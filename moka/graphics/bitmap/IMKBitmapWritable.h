@@ -1,7 +1,6 @@
 // IMKBitmapWritable: a bitmap, or a strip of one, as a render target.
 // Thread: the two plain operations post; those ending in RT run on the render thread, where `release` says
-// whether
-//         to drop one reference at the end (true when reached through a task).
+//         whether to drop one reference at the end (true when reached through a task).
 #pragma once
 
 #include "moka/graphics/math/Matrix4.h"

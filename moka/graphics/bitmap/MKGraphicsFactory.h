@@ -3,8 +3,8 @@
 // CPU
 //         bitmap is the caller's to delete.
 // Thread: any; no state. useQueue chooses the flavour: not 0 makes caller-side objects, usable from any
-// thread,
-//         whose work is posted to queue; 0 makes render-thread objects, to be made and used there only.
+//         thread, whose work is posted to queue; 0 makes render-thread objects, to be made and used there
+//         only.
 // Units:  pixels; RGBA8, premultiplied.
 // Fails:  null; an invalid request, and a file that cannot be decoded, log one error line.
 #pragma once

@@ -36,7 +36,7 @@ Bitmap* DecodeForCpu(Request const& load) {
 std::unique_ptr<Bitmap> Decode(Request const& load) {
     std::unique_ptr<Bitmap> bitmap;
     Guard("BitmapLoaderImpl::LoadBitmap decoding", [&] {
-        bitmap.reset(load.bitmapType == BitmapType::Cpu ? DecodeForCpu(load)
+        bitmap.reset(load.bitmapType == BITMAP_TYPE_CPU ? DecodeForCpu(load)
                                                         : MKGraphicsFactory::CreateScaledCPUBitmap(
                                                               &load.path, load.loadWidth, load.loadHeight));
     });
@@ -142,13 +142,13 @@ Request BitmapLoaderImpl::AwaitRequest() {
     }
     LogInfo("BitmapLoaderImpl::EventLoop queue size(%d)", GetQueueSize());
     Request request = std::move(*mQueue->GetHead());
-    (request.type == RequestType::Save ? mSaveTaskRunning : mLoadTaskRunning) = true;
+    (request.type == REQUEST_SAVE ? mSaveTaskRunning : mLoadTaskRunning) = true;
     return request;
 }
 
 void BitmapLoaderImpl::Process(Request& request) {
     PathForLog<kMaxLoggedPathBytes> const path(request.path);
-    if (request.type == RequestType::Load) {
+    if (request.type == REQUEST_LOAD) {
         LogInfo("BitmapLoaderImpl::EventLoop process load request[%d]: %s", request.serial, path.Get());
         LoadBitmap(request);
         LogInfo("BitmapLoaderImpl::EventLoop process load request[%d] done: %s", request.serial, path.Get());
@@ -162,7 +162,7 @@ void BitmapLoaderImpl::Process(Request& request) {
 void BitmapLoaderImpl::LoadBitmap(Request& request) {
     std::unique_ptr<Bitmap> decoded = Decode(request);
     bool const wasDecoded = decoded != nullptr;
-    if (request.bitmapType == BitmapType::Cpu) {
+    if (request.bitmapType == BITMAP_TYPE_CPU) {
         ConfirmLoad(request);
         Report(request, decoded.get(), wasDecoded);
         Discard(request, std::move(decoded));

@@ -43,7 +43,7 @@ bool BitmapLoaderImpl::RequestLoad(BitmapLoaderInterface* listener, int id, Stri
     if (!listener) return false;
     AutoCriticalSection const lock(*mLock);
     if (!mQueue || mQueue->HasLoad(listener, id)) return false;
-    RequestList load = MakeRequest(RequestType::Load, listener, id, path);
+    RequestList load = MakeRequest(REQUEST_LOAD, listener, id, path);
     if (load.empty()) return false;
     load.front().bitmapType = type;
     load.front().msgQueue = queue;
@@ -54,7 +54,7 @@ bool BitmapLoaderImpl::RequestLoad(BitmapLoaderInterface* listener, int id, Stri
 
 bool BitmapLoaderImpl::RequestSave(BitmapLoaderInterface* listener, int id, String const& path,
                                    IMKBitmap& bitmap, void* userData, int quality) {
-    RequestList save = MakeRequest(RequestType::Save, listener, id, path);
+    RequestList save = MakeRequest(REQUEST_SAVE, listener, id, path);
     if (save.empty()) return false;
     Request& request = save.front();
     request.buffer.reset(AllocateCleared(GetBufferSize(bitmap)));
@@ -76,7 +76,7 @@ bool BitmapLoaderImpl::RequestSave(BitmapLoaderInterface* listener, int id, Stri
                                    unsigned char* buffer, int width, int height, void* userData,
                                    int quality) {
     if (!buffer) return false;
-    RequestList save = MakeRequest(RequestType::Save, listener, id, path);
+    RequestList save = MakeRequest(REQUEST_SAVE, listener, id, path);
     if (save.empty()) return false;
     Request& request = save.front();
     request.buffer.reset(buffer);

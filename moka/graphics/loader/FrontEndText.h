@@ -17,7 +17,7 @@ struct FrontEndText;
 
 template <>
 struct FrontEndText<IMKBitmap> {
-    static constexpr BitmapType kType = BitmapType::Graphics;
+    static constexpr BitmapType kType = BITMAP_TYPE_GRAPHICS;
     static constexpr char const* kTag = "MKBitmapLoader";
     static constexpr char const* kDestructor = "MKBitmapLoader[%p:%s] ~MKBitmapLoader";
     static constexpr char const* kRequestLoad = "MKBitmapLoader[%p:%s] RequestLoad(%d) ret %s";
@@ -40,7 +40,7 @@ struct FrontEndText<IMKBitmap> {
 
 template <>
 struct FrontEndText<Bitmap> {
-    static constexpr BitmapType kType = BitmapType::Cpu;
+    static constexpr BitmapType kType = BITMAP_TYPE_CPU;
     static constexpr char const* kTag = "BitmapLoader";
     static constexpr char const* kDestructor = "BitmapLoader[%p:%s] ~BitmapLoader";
     static constexpr char const* kRequestLoad = "BitmapLoader[%p:%s] RequestLoad(%d) ret %s";

@@ -30,7 +30,7 @@ RequestList TakeRequest(RequestList& from, void const* request) {
 
 void ClearSaveListener(RequestList& requests, BitmapLoaderInterface const* listener) {
     for (Request& request : requests)
-        if (request.type == RequestType::Save && request.listener == listener) request.listener = nullptr;
+        if (request.type == REQUEST_SAVE && request.listener == listener) request.listener = nullptr;
 }
 
 } // namespace Moka::detail

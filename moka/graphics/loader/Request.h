@@ -13,19 +13,19 @@ class IGLMsgQueue;
 
 namespace detail {
 
-enum class RequestType { Load, Save };
-enum class BitmapType { Cpu, Graphics };
+enum RequestType { REQUEST_LOAD = 0, REQUEST_SAVE = 1, REQUEST_NONE = 2 };
+enum BitmapType { BITMAP_TYPE_CPU = 0, BITMAP_TYPE_GRAPHICS = 1 };
 
 // Moving one leaves behind what says which request it was; the path and the pixels go along.
 struct Request {
-    RequestType type = RequestType::Load;
+    RequestType type = REQUEST_NONE;           // until it is filled in
     int serial = -1;                           // in the order of queueing
     BitmapLoaderInterface* listener = nullptr; // null: nobody is called back
     int id = 0;                                // the caller's
     String path;
 
     // Loads. One side that is 0 means the file's own size.
-    BitmapType bitmapType = BitmapType::Cpu;
+    BitmapType bitmapType = BITMAP_TYPE_CPU;
     IGLMsgQueue* msgQueue = nullptr;
     int loadWidth = 0;
     int loadHeight = 0;

@@ -13,7 +13,7 @@ std::size_t RequestQueue::Hash::operator()(LoadKey const& key) const {
 }
 
 bool RequestQueue::Append(RequestList& request) noexcept {
-    if (request.front().type == RequestType::Load) {
+    if (request.front().type == REQUEST_LOAD) {
         try {
             mLoads.emplace(KeyOf(request.front()), request.begin());
         } catch (std::bad_alloc const&) {
@@ -25,7 +25,7 @@ bool RequestQueue::Append(RequestList& request) noexcept {
 }
 
 RequestList RequestQueue::Take(Position at) {
-    if (at->type == RequestType::Load) mLoads.erase(KeyOf(*at));
+    if (at->type == REQUEST_LOAD) mLoads.erase(KeyOf(*at));
     RequestList taken;
     taken.splice(taken.end(), mRequests, at);
     return taken;
@@ -41,7 +41,7 @@ RequestList RequestQueue::TakeLoad(BitmapLoaderInterface* listener, int id) {
 void RequestQueue::RemoveAllLoads(BitmapLoaderInterface const* listener) {
     for (Position at = mRequests.end(); at != mRequests.begin();) {
         --at;
-        if (at->type != RequestType::Load || at->listener != listener) continue;
+        if (at->type != REQUEST_LOAD || at->listener != listener) continue;
         mLoads.erase(KeyOf(*at));
         at = mRequests.erase(at);
     }

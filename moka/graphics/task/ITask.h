@@ -1,11 +1,9 @@
 // ITask: one piece of work for the render thread, carried there by an IGLMsgQueue.
 // Owner:   the poster until a queue accepts it; then the queue, which runs it once and frees it. A refused
-// task
-//          goes back to the poster, who frees it without running it.
+//          task goes back to the poster, who frees it without running it.
 // Thread:  built on any thread, run on the queue's consumer, freed on either.
 // Cost:    allocated from a pool of fixed blocks (TaskMemory.h), linked through its own field: posting
-// allocates
-//          nothing else. Only the non-throwing form of new exists; null means that memory ran out.
+//          allocates nothing else. Only the non-throwing form of new exists; null means that memory ran out.
 #pragma once
 
 #include "moka/base/Export.h"

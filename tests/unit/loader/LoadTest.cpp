@@ -11,11 +11,13 @@
 namespace Moka::Testing {
 namespace {
 
+using detail::BITMAP_TYPE_CPU;
+using detail::BITMAP_TYPE_GRAPHICS;
 using detail::BitmapType;
 
 class Load : public LoaderFixture {
 protected:
-    bool Request(int id, String const& path, BitmapType type = BitmapType::Cpu, int width = 0,
+    bool Request(int id, String const& path, BitmapType type = BITMAP_TYPE_CPU, int width = 0,
                  int height = 0) {
         return Loader().RequestLoad(&listener, id, path, type, queue.get(), width, height);
     }
@@ -31,11 +33,11 @@ protected:
 
 TEST_F(Load, PendingThenTheResultThenCompletedForEveryKind) {
     for (char const* name : {"a.png", "a.webp", "a.mki"}) WritePicture(name);
-    EXPECT_TRUE(Request(1, Path("a.png"), BitmapType::Cpu));
-    EXPECT_TRUE(Request(2, Path("a.webp"), BitmapType::Graphics));
-    EXPECT_TRUE(Request(3, Path("a.mki"), BitmapType::Graphics, 3, 2));
-    EXPECT_TRUE(Request(4, Path("a.mki"), BitmapType::Cpu, 3, 2));
-    EXPECT_TRUE(Request(5, Path("a.png"), BitmapType::Cpu, 3, 0)) << "one side alone scales nothing";
+    EXPECT_TRUE(Request(1, Path("a.png"), BITMAP_TYPE_CPU));
+    EXPECT_TRUE(Request(2, Path("a.webp"), BITMAP_TYPE_GRAPHICS));
+    EXPECT_TRUE(Request(3, Path("a.mki"), BITMAP_TYPE_GRAPHICS, 3, 2));
+    EXPECT_TRUE(Request(4, Path("a.mki"), BITMAP_TYPE_CPU, 3, 2));
+    EXPECT_TRUE(Request(5, Path("a.png"), BITMAP_TYPE_CPU, 3, 0)) << "one side alone scales nothing";
     listener.AwaitCompleted(5);
     EXPECT_EQ(listener.GetEvents(),
               (Events{"pending", "load 1 5x4", "completed", "pending", "load 2 5x4", "completed", "pending",
@@ -48,7 +50,7 @@ TEST_F(Load, ATallPictureArrivesWholeAndTagged) {
     String const path = WritePicture("tall.mki", image.width, image.height);
     RefPtr<IMKBitmap> kept;
     listener.whenLoaded = [&](Bitmap*, IMKBitmap* bitmap) { kept = RefPtr<IMKBitmap>::Share(bitmap); };
-    Request(1, path, BitmapType::Graphics);
+    Request(1, path, BITMAP_TYPE_GRAPHICS);
     listener.AwaitCompleted(1);
     ASSERT_TRUE(kept);
     EXPECT_STREQ(kept->GetTag(), "BitmapLoaderImpl::LoadBitmap (CreateScaledCPUBitmap)");
@@ -63,7 +65,7 @@ TEST_F(Load, LogsEachStep) {
     std::string const text = path.ToUtf8();
     AwaitIdle();
     log.Clear();
-    Request(1, path, BitmapType::Graphics);
+    Request(1, path, BITMAP_TYPE_GRAPHICS);
     AwaitLine("BitmapLoaderImpl::EventLoop Wait!");
     std::string const serial = std::to_string(GetLoggedSerial("BitmapLoaderImpl::AddRequest"));
     EXPECT_EQ(LinesOf("BitmapLoaderImpl"),
@@ -76,7 +78,7 @@ TEST_F(Load, LogsEachStep) {
                       "BitmapLoaderImpl::EventLoop Wait!"}));
     System::SetBuildTypeEngMode(false);
     log.Clear();
-    Request(2, Path("missing.mki"), BitmapType::Graphics);
+    Request(2, Path("missing.mki"), BITMAP_TYPE_GRAPHICS);
     AwaitLine("BitmapLoaderImpl::EventLoop Wait!");
     EXPECT_EQ(log.Count(ANDROID_LOG_INFO, folder.string()), 0) << "paths are for engineering builds";
     EXPECT_EQ(log.Find("BitmapLoaderImpl::LoadBitmap (CreateScaledCPUBitmap): bitmap is null").priority,
@@ -86,7 +88,7 @@ TEST_F(Load, LogsEachStep) {
 
 TEST_F(Load, ACancelledDecodeCallsNobodyAndItsIdIsFreeAgain) {
     String const path = WritePicture("a.mki");
-    for (BitmapType const type : {BitmapType::Cpu, BitmapType::Graphics}) {
+    for (BitmapType const type : {BITMAP_TYPE_CPU, BITMAP_TYPE_GRAPHICS}) {
         RecordingListener other;
         AwaitIdle();
         log.Clear();
@@ -118,8 +120,8 @@ TEST_F(Load, AnIdIsRefusedWhileItWaitsOrIsDecoded) {
     EXPECT_FALSE(Request(1, path)) << "being decoded";
     EXPECT_TRUE(Request(2, path));
     EXPECT_FALSE(Request(2, Path("another.mki"))) << "waiting";
-    EXPECT_TRUE(Loader().RequestLoad(&other, 1, path, BitmapType::Cpu, queue.get(), 0, 0));
-    EXPECT_FALSE(Loader().RequestLoad(nullptr, 1, path, BitmapType::Cpu, queue.get(), 0, 0));
+    EXPECT_TRUE(Loader().RequestLoad(&other, 1, path, BITMAP_TYPE_CPU, queue.get(), 0, 0));
+    EXPECT_FALSE(Loader().RequestLoad(nullptr, 1, path, BITMAP_TYPE_CPU, queue.get(), 0, 0));
     gate.Open();
     listener.AwaitCompleted(2);
     other.AwaitCompleted(1);
@@ -134,7 +136,7 @@ TEST_F(Load, CancelAllDropsTheLoadsOfOneListenerAndNothingElse) {
     CodecGate gate;
     for (int id = 0; id < 5; ++id) {
         Request(id, path);
-        Loader().RequestLoad(&other, id, path, BitmapType::Cpu, queue.get(), 0, 0);
+        Loader().RequestLoad(&other, id, path, BITMAP_TYPE_CPU, queue.get(), 0, 0);
     }
     Loader().RequestSave(&listener, 9, Path("s.png"), NewPixels(image), 3, 3, nullptr, 100);
     gate.AwaitArrival();
@@ -158,7 +160,7 @@ TEST_F(Load, BrokenFilesAreErrorsAndTheLoopGoesOn) {
                                     String(""),
                                     String(".mki")};
     int count = 0;
-    for (BitmapType const type : {BitmapType::Cpu, BitmapType::Graphics}) {
+    for (BitmapType const type : {BITMAP_TYPE_CPU, BITMAP_TYPE_GRAPHICS}) {
         for (String const& path : paths) {
             EXPECT_TRUE(Request(count, path, type));
             listener.AwaitCompleted(count + 1);
@@ -201,7 +203,7 @@ TEST_F(Load, WhatIsThrownIsOneLineAndTheRestStillComes) {
         throw std::runtime_error(event);
     };
     Request(1, path);
-    Request(2, path, BitmapType::Graphics);
+    Request(2, path, BITMAP_TYPE_GRAPHICS);
     listener.AwaitCompleted(2);
     AwaitIdle();
     EXPECT_EQ(log.GetTexts(ANDROID_LOG_ERROR),
@@ -213,7 +215,7 @@ TEST_F(Load, WhatIsThrownIsOneLineAndTheRestStillComes) {
     {
         ThrowingCodecs const codecs;
         Request(3, path);
-        Request(4, path, BitmapType::Graphics);
+        Request(4, path, BITMAP_TYPE_GRAPHICS);
         listener.AwaitCompleted(4);
     }
     EXPECT_EQ(listener.GetEvents()[7], "error 3");
@@ -221,7 +223,7 @@ TEST_F(Load, WhatIsThrownIsOneLineAndTheRestStillComes) {
 }
 
 TEST_F(Load, AGpuBitmapThatCannotBeMadeIsAnErrorThatEndsAsALoad) {
-    Loader().RequestLoad(&listener, 1, WritePicture("a.mki"), BitmapType::Graphics, nullptr, 0, 0);
+    Loader().RequestLoad(&listener, 1, WritePicture("a.mki"), BITMAP_TYPE_GRAPHICS, nullptr, 0, 0);
     listener.AwaitCompleted(1);
     AwaitIdle();
     EXPECT_EQ(listener.GetEvents(), (Events{"pending", "error 1", "completed"}));
@@ -239,14 +241,14 @@ TEST_F(Load, ACpuBitmapDiesOnItsQueueBehindTheCallbacks) {
             EXPECT_EQ(pumped.GetPendingCount(), 0);
         }
     };
-    Loader().RequestLoad(&listener, 1, path, BitmapType::Cpu, &pumped, 0, 0);
+    Loader().RequestLoad(&listener, 1, path, BITMAP_TYPE_CPU, &pumped, 0, 0);
     listener.AwaitCompleted(1);
     Loader().WaitUntilMsgQueueRequired();
     EXPECT_EQ(seen->GetBuffer()[3], 255) << "still alive";
     EXPECT_EQ(pumped.RunAll(), 1);
 
     CodecGate gate;
-    Loader().RequestLoad(&listener, 2, path, BitmapType::Cpu, &pumped, 0, 0);
+    Loader().RequestLoad(&listener, 2, path, BITMAP_TYPE_CPU, &pumped, 0, 0);
     gate.AwaitArrival();
     Loader().CancelLoadRequest(&listener, 2);
     gate.Open();
@@ -260,7 +262,7 @@ TEST_F(Load, ACpuBitmapThatNoQueueTakesBelongsToWhoeverGotIt) {
     std::unique_ptr<Bitmap> kept;
     listener.whenLoaded = [&](Bitmap* bitmap, IMKBitmap*) { kept.reset(bitmap); };
     for (IGLMsgQueue* none : {static_cast<IGLMsgQueue*>(&refusing), static_cast<IGLMsgQueue*>(nullptr)}) {
-        Loader().RequestLoad(&listener, 1, path, BitmapType::Cpu, none, 0, 0);
+        Loader().RequestLoad(&listener, 1, path, BITMAP_TYPE_CPU, none, 0, 0);
         Loader().WaitForAllSaveRequestsToEnd();
         Loader().WaitUntilMsgQueueRequired();
         ASSERT_TRUE(kept);
@@ -268,7 +270,7 @@ TEST_F(Load, ACpuBitmapThatNoQueueTakesBelongsToWhoeverGotIt) {
         kept.reset();
     }
     CodecGate gate;
-    Loader().RequestLoad(&listener, 1, path, BitmapType::Cpu, &refusing, 0, 0);
+    Loader().RequestLoad(&listener, 1, path, BITMAP_TYPE_CPU, &refusing, 0, 0);
     gate.AwaitArrival();
     Loader().CancelAllLoadRequest(&listener);
     gate.Open();
@@ -286,7 +288,7 @@ TEST_F(Load, ARefusingQueueStillGivesABitmap) {
     listener.whenLoaded = [&](Bitmap*, IMKBitmap* bitmap) {
         strip = bitmap->GetTextureBitmap()->GetSubBitmap(0);
     };
-    Loader().RequestLoad(&listener, 1, WritePicture("a.mki"), BitmapType::Graphics, &refusing, 0, 0);
+    Loader().RequestLoad(&listener, 1, WritePicture("a.mki"), BITMAP_TYPE_GRAPHICS, &refusing, 0, 0);
     listener.AwaitCompleted(1);
     EXPECT_EQ(listener.GetEvents()[1], "load 1 5x4");
     AwaitIdle();

@@ -165,7 +165,7 @@ TEST_F(Save, ARemovedCallbackLeavesTheFile) {
     gate.AwaitArrival();
     Request(3, "queued.png");
     Loader().RequestSave(&other, 4, Path("other.png"), NewPixels(image), 40, 30, nullptr, 100);
-    Loader().RequestLoad(&listener, 5, Path("missing.png"), detail::BitmapType::Cpu, nullptr, 0, 0);
+    Loader().RequestLoad(&listener, 5, Path("missing.png"), detail::BITMAP_TYPE_CPU, nullptr, 0, 0);
     Loader().RemoveAllSaveCallback(&listener);
     gate.Open();
     bitmap.deliver();
@@ -178,7 +178,7 @@ TEST_F(Save, ARemovedCallbackLeavesTheFile) {
 
 TEST_F(Save, ALoadQueuedBehindASaveReadsWhatItWrote) {
     Request(1, "s.mki");
-    Loader().RequestLoad(&listener, 2, Path("s.mki"), detail::BitmapType::Cpu, queue.get(), 0, 0);
+    Loader().RequestLoad(&listener, 2, Path("s.mki"), detail::BITMAP_TYPE_CPU, queue.get(), 0, 0);
     listener.AwaitCompleted(2);
     EXPECT_EQ(listener.GetEvents()[4], "load 2 40x30");
 }
@@ -194,7 +194,7 @@ TEST_F(Save, ARequestThatMemoryRunsOutForIsRefusedAndLeavesThePixels) {
         FailAllocations const fail;
         saves = Loader().RequestSave(&listener, 1, path, pixels, 40, 30, nullptr, 100);
         savesBitmap = Loader().RequestSave(&listener, 1, path, bitmap, nullptr, 100);
-        loads = Loader().RequestLoad(&listener, 1, path, detail::BitmapType::Cpu, nullptr, 0, 0);
+        loads = Loader().RequestLoad(&listener, 1, path, detail::BITMAP_TYPE_CPU, nullptr, 0, 0);
     }
     EXPECT_FALSE(saves);
     EXPECT_FALSE(savesBitmap);
