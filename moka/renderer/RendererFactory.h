@@ -4,14 +4,21 @@
 #pragma once
 
 #include "moka/base/Export.h"
+#include "moka/renderer/BlendStateDescriptor.h"
+#include "moka/renderer/DepthStencilStateDescriptor.h"
+#include "moka/renderer/IGraphicsObject.h"
 #include "moka/renderer/PixelBuffer.h"
 #include "moka/renderer/RendererStatistics.h"
 #include "moka/renderer/TextureDescriptor.h"
 #include "moka/renderer/TextureParameter.h"
+#include "moka/renderer/VertexDescriptor.h"
 
 namespace Moka {
 
+class IBlendStateObject;
 class IDepthStencilBuffer;
+class IDepthStencilState;
+class IRasterizerState;
 class IRendererDeviceCaps;
 class IRenderTarget;
 class IShaderProgram;
@@ -62,14 +69,37 @@ public:
     static IShaderProgram* CreateShaderProgram(char const* vertexSource, char const* fragmentSource,
                                                char const* name);
 
-    // While deferred, the host's frame buffer is given back by Flush() instead of at every deactivation. Off
-    // until switched on; a host switches it on when it calls Flush() whenever its queue runs empty.
+    // Vertices of one stream, not indexed, drawn one instance at a time: streams is 1, indices and
+    // instanceStreams are 0; anything else, and a descriptor without attributes, is refused.
+    static IGraphicsObject* CreateGraphicsObject(int streams, PrimitiveType primitive,
+                                                 VertexDescriptor const* descriptor, int indices,
+                                                 int instanceStreams);
+
+    static IBlendStateObject* CreateBlendStateObject(BlendStateDescriptor const& descriptor);
+    static IDepthStencilState* CreateDepthStencilState(DepthStencilStateDescriptor const& descriptor);
+
+    // Never null; not to be released.
+    static IRasterizerState* GetRasterizerState();
+
+    // While on, the stencil test in force is a clip that what is drawn must not switch off: applying a state
+    // without a stencil test leaves it alone, and clearing the colour fills through it.
+    static void SetStencilClip(bool on);
+
+    // Off until switched on. Immediate: everything asked for between an activation and its deactivation
+    // reaches GL at the deactivation, and the host gets its frame buffer back there. Deferred: when somebody
+    // could see the difference, at the latest in Flush(); a host switches it on when it calls Flush()
+    // whenever its queue runs empty.
     static void SetDeferred(bool on);
 
     // Before foreign GL: everything asked for so far has reached GL. The host's frame buffers, viewport,
-    // culling, depth test and dither are as they were, pixel store holds GL's defaults, no sampler is bound;
-    // texture bindings and the program are not given back. An active target stays the active one.
+    // vertex array, culling, depth test and dither are as they were, pixel store holds GL's defaults, no
+    // sampler is bound. Scissor, blend, stencil and masks are as last set or applied here; texture bindings
+    // and the program are not given back. An active target stays the active one.
     static void Flush();
+    // Before foreign GL that draws into the active target: everything asked for so far has reached GL, the
+    // target is bound, and viewport, scissor, blend, stencil, masks, program and textures are as last set or
+    // applied here. Until InvalidateState() every operation reaches GL at once.
+    static void Commit();
     // After foreign GL: forgets what the renderer believed the GL state to be.
     static void InvalidateState();
 

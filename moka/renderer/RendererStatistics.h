@@ -17,11 +17,30 @@ struct RendererStatistics {
     int textureObjects = 0;
     int depthStencilBuffers = 0;
     int programs = 0;
+    int graphicsObjects = 0;
+    int stateObjects = 0; // blend and depth-stencil states
+    int buffers = 0;      // vertex buffers and vertex arrays of the context's own, kept until it is detached
 
+    // What was asked for, and what of it reached the driver.
+    std::uint64_t drawRequests = 0;
+    std::uint64_t draws = 0;
+    std::uint64_t plays = 0;     // of the draw list
+    std::uint64_t listBytes = 0; // memory that the draw list holds
+
+    // Calls that change what the driver has.
     std::uint64_t frameBufferSwitches = 0;
+    std::uint64_t programSwitches = 0;
+    std::uint64_t uniformChanges = 0;
+    std::uint64_t textureSwitches = 0;
+    std::uint64_t blendChanges = 0; // with the colour mask
+    std::uint64_t depthStencilChanges = 0;
+    std::uint64_t scissorChanges = 0;
+    std::uint64_t queries = 0; // questions to the driver, each of which may wait for it
+
     std::uint64_t clears = 0;
     std::uint64_t copies = 0;
-    std::uint64_t bytesUploaded = 0;
+    std::uint64_t bytesUploaded = 0; // texels
+    std::uint64_t vertexBytes = 0;
     std::uint64_t bytesReadBack = 0;
     std::uint64_t errors = 0; // GL errors and error-severity debug messages
 };

@@ -1,5 +1,6 @@
 #include "tests/support/RecordingDevice.h"
 
+#include "moka/base/log/AndroidLog.h"
 #include "tests/support/RecordingObjects.h"
 
 #include <algorithm>
@@ -25,7 +26,8 @@ void Surface::Grow(int w, int h) {
 }
 
 std::string ObjectState::GetName() const {
-    static char const* const kNames[] = {"texture ", "target ", "buffer ", "program "};
+    static char const* const kNames[] = {"texture ",  "target ", "buffer ",      "program ",
+                                         "graphics ", "blend ",  "depthstencil "};
     return kNames[static_cast<int>(kind)] + std::to_string(number);
 }
 
@@ -36,7 +38,7 @@ Device& Device::Get() {
 }
 
 void Device::Record(std::string const& object, char const* operation, std::string const& arguments) {
-    calls.push_back({object, operation, arguments});
+    if (keepsRecords) calls.push_back({object, operation, arguments});
 }
 
 void Device::CheckThread(std::string const& object, char const* operation) {
@@ -45,6 +47,15 @@ void Device::CheckThread(std::string const& object, char const* operation) {
     } else if (renderThread != std::this_thread::get_id()) {
         Violate(object + " " + operation + " outside the render thread");
     }
+}
+
+bool Device::MayCreate(ObjectKind kind, char const* function, std::string const& arguments) {
+    CheckThread("renderer", function);
+    bool const fails = TakeFailure(kind);
+    if (attached && !fails) return true;
+    Record("renderer", function, arguments + " failed");
+    __android_log_print(ANDROID_LOG_ERROR, "mok_log", "RendererFactory::%s failed", function);
+    return false;
 }
 
 bool Device::TakeFailure(ObjectKind kind) {
@@ -69,6 +80,9 @@ RendererStatistics Device::CountObjects() const {
     result.depthStencilBuffers = CountLive(ObjectKind::DepthStencilBuffer, false);
     result.renderBuffers = result.depthStencilBuffers;
     result.programs = CountLive(ObjectKind::Program, false);
+    result.graphicsObjects = CountLive(ObjectKind::GraphicsObject, false);
+    result.stateObjects =
+        CountLive(ObjectKind::BlendState, false) + CountLive(ObjectKind::DepthStencilState, false);
     std::set<Surface const*> storages;
     for (auto const& object : objects) {
         if (object->released || object->context != context) continue;
@@ -85,11 +99,26 @@ RendererStatistics Device::CountObjects() const {
     return result;
 }
 
-Operation::Operation(ObjectState const& object, char const* name, std::string const& arguments)
-    : mDevice(Device::Get()) {
-    mDevice.mutex.lock();
-    mDevice.Record(object.GetName(), name, arguments);
-    Check(object, name);
+void Device::EndObject(ObjectState& object) {
+    if (object.released) return;
+    object.released = true;
+    FreeIfUnused(object);
+}
+
+void Device::FreeIfUnused(ObjectState const& object) {
+    if (!keepsRecords && !object.MustStay()) objects.erase(object.place);
+}
+
+void Device::FreeReleased() {
+    objects.remove_if([](auto const& object) { return !object->MustStay(); });
+}
+
+void Device::ForgetState() {
+    active = nullptr;
+    currentProgram = nullptr;
+    boundTextures.clear();
+    host.reset();
+    state = {};
 }
 
 Operation::Operation(Quiet, ObjectState const& object, char const* name) : mDevice(Device::Get()) {
@@ -104,11 +133,9 @@ void Operation::Check(ObjectState const& object, char const* name) {
     }
     // Left over from an earlier context: inert, and no thread is the wrong one.
     if (!mDevice.attached || object.context != mDevice.context) return;
-    mDevice.CheckThread(object.GetName(), name);
+    if (!mDevice.IsRenderThread()) mDevice.CheckThread(object.GetName(), name);
     mUsable = true;
 }
-
-std::string Join(Rect const& rect) { return Join(rect.left, rect.top, rect.right, rect.bottom); }
 
 Rect ClipBlock(int x, int y, int blockWidth, int blockHeight, int width, int height) {
     // Wide arithmetic: a hostile block must not wrap round into the image.

@@ -37,16 +37,6 @@ private:
 
 RecordingCaps const theCaps;
 
-// A creation that a test asked to fail, or that has no context, logs as a real renderer does.
-bool MayCreate(Device& device, ObjectKind kind, char const* function, std::string const& arguments) {
-    device.CheckThread("renderer", function);
-    bool const fails = device.TakeFailure(kind);
-    if (device.attached && !fails) return true;
-    device.Record("renderer", function, arguments + " failed");
-    __android_log_print(ANDROID_LOG_ERROR, "mok_log", "RendererFactory::%s failed", function);
-    return false;
-}
-
 bool IsValid(Device& device, TextureDescriptor const& descriptor) {
     int const largest = device.GetMaxTextureSize();
     char const* reason = nullptr;
@@ -118,6 +108,7 @@ bool RendererFactory::AttachContext(RendererLimits const& limits, RendererProcLo
     device.renderThread = std::this_thread::get_id();
     device.limitedTextureSize = limits.maxTextureSize;
     device.counters = {};
+    device.ForgetState();
     return true;
 }
 
@@ -126,10 +117,7 @@ void RendererFactory::DetachContext() {
     DeviceLock lock(device.mutex);
     device.CheckThread("renderer", "DetachContext");
     device.attached = false;
-    device.active = nullptr;
-    device.currentProgram = nullptr;
-    device.boundTextures.clear();
-    device.host.reset();
+    device.ForgetState();
 }
 
 IRendererDeviceCaps const* RendererFactory::GetRendererDeviceCaps() { return &theCaps; }
@@ -144,7 +132,7 @@ ITextureObject* RendererFactory::CreateTextureObject(TextureDescriptor const& de
     Device& device = Device::Get();
     DeviceLock lock(device.mutex);
     std::string const arguments = Describe(descriptor, source);
-    if (!MayCreate(device, ObjectKind::Texture, "CreateTextureObject", arguments)) return nullptr;
+    if (!device.MayCreate(ObjectKind::Texture, "CreateTextureObject", arguments)) return nullptr;
     if (!IsValid(device, descriptor)) return nullptr;
     std::shared_ptr<Surface> surface = ChooseSurface(device, descriptor);
     if (!surface) return nullptr;
@@ -159,8 +147,7 @@ IRenderTarget* RendererFactory::CreateOffscreenRenderTarget(ITextureObject* text
     Device& device = Device::Get();
     DeviceLock lock(device.mutex);
     std::string const arguments = RecordingRenderer::NameOf(texture);
-    if (!MayCreate(device, ObjectKind::RenderTarget, "CreateOffscreenRenderTarget", arguments))
-        return nullptr;
+    if (!device.MayCreate(ObjectKind::RenderTarget, "CreateOffscreenRenderTarget", arguments)) return nullptr;
     if (!texture) {
         __android_log_print(ANDROID_LOG_ERROR, "mok_log",
                             "RendererFactory::CreateOffscreenRenderTarget: no texture");
@@ -178,7 +165,7 @@ IRenderTarget* RendererFactory::CreateRenderTargetFromDefault(int width, int hei
     Device& device = Device::Get();
     DeviceLock lock(device.mutex);
     std::string const arguments = Join("default", width, height);
-    if (!MayCreate(device, ObjectKind::RenderTarget, "CreateRenderTargetFromDefault", arguments))
+    if (!device.MayCreate(ObjectKind::RenderTarget, "CreateRenderTargetFromDefault", arguments))
         return nullptr;
     if (!device.host) device.host = std::make_shared<Surface>(0, 0);
     device.host->Grow(std::max(width, 0), std::max(height, 0));
@@ -189,7 +176,7 @@ IRenderTarget* RendererFactory::CreateRenderTargetFromCurrent(int width, int hei
     Device& device = Device::Get();
     DeviceLock lock(device.mutex);
     std::string const arguments = Join("current", width, height);
-    if (!MayCreate(device, ObjectKind::RenderTarget, "CreateRenderTargetFromCurrent", arguments))
+    if (!device.MayCreate(ObjectKind::RenderTarget, "CreateRenderTargetFromCurrent", arguments))
         return nullptr;
     if (device.active) {
         return AddTarget(device, device.active->ShareSurface(), width, height, false, arguments);
@@ -203,7 +190,7 @@ IDepthStencilBuffer* RendererFactory::CreateDepthStencilBuffer(int width, int he
     Device& device = Device::Get();
     DeviceLock lock(device.mutex);
     std::string const arguments = Join(width, height);
-    if (!MayCreate(device, ObjectKind::DepthStencilBuffer, "CreateDepthStencilBuffer", arguments)) {
+    if (!device.MayCreate(ObjectKind::DepthStencilBuffer, "CreateDepthStencilBuffer", arguments)) {
         return nullptr;
     }
     if (width < 1 || height < 1) {
@@ -221,30 +208,34 @@ IShaderProgram* RendererFactory::CreateShaderProgram(char const* vertexSource, c
     Device& device = Device::Get();
     DeviceLock lock(device.mutex);
     device.CheckThread("renderer", "CreateShaderProgram");
-    auto* const program = device.Add<RecordingProgram>(vertexSource, fragmentSource);
-    device.Record(program->GetName(), "Create", name ? name : "");
+    char const* const label = name ? name : "";
+    auto* const program = device.Add<RecordingProgram>(vertexSource, fragmentSource, label);
+    device.Record(program->GetName(), "Create", label);
     return program;
 }
 
 void RendererFactory::SetDeferred(bool on) {
     Device& device = Device::Get();
     DeviceLock lock(device.mutex);
-    device.Record("renderer", "SetDeferred", Join(on));
-    device.CheckThread("renderer", "SetDeferred");
+    device.RecordStatic("renderer", "SetDeferred", on);
 }
 
 void RendererFactory::Flush() {
     Device& device = Device::Get();
     DeviceLock lock(device.mutex);
-    device.Record("renderer", "Flush", {});
-    device.CheckThread("renderer", "Flush");
+    device.RecordStatic("renderer", "Flush");
+}
+
+void RendererFactory::Commit() {
+    Device& device = Device::Get();
+    DeviceLock lock(device.mutex);
+    device.RecordStatic("renderer", "Commit");
 }
 
 void RendererFactory::InvalidateState() {
     Device& device = Device::Get();
     DeviceLock lock(device.mutex);
-    device.Record("renderer", "InvalidateState", {});
-    device.CheckThread("renderer", "InvalidateState");
+    device.RecordStatic("renderer", "InvalidateState");
 }
 
 RendererStatistics RendererFactory::GetStatistics() {

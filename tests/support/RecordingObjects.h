@@ -10,6 +10,7 @@
 #include "moka/renderer/TextureParameter.h"
 #include "tests/support/RecordingDevice.h"
 
+#include <array>
 #include <cstddef>
 #include <new>
 
@@ -44,6 +45,7 @@ struct TextureState final : ObjectState {
     static constexpr ObjectKind kKind = ObjectKind::Texture;
 
     TextureState(int textureNumber, int textureContext, std::shared_ptr<Surface> image);
+    ~TextureState() override;
 
     // False, with a log line, for what names no parameter or no value of it.
     bool SetParameter(int id, int value);
@@ -101,6 +103,11 @@ public:
     }
 
 private:
+    // The part of a block that this target has; one made from the current frame buffer can claim more.
+    Rect Clip(ScissorRect const& rect) const;
+    // The target's part of what is written down about a clear of it.
+    RecordedClear DescribeClear(PipelineState const& state) const;
+
     std::shared_ptr<Surface> mSurface;
     int mWidth;
     int mHeight;
@@ -108,21 +115,43 @@ private:
     RecordingBuffer* mAttached = nullptr;
 };
 
+// The value of a uniform, by its type.
+struct UniformValue {
+    static UniformValue Read(BindingType type, void const* value);
+
+    std::vector<float> GetNumbers() const;
+
+    BindingType type = BindingTypeUnknown;
+    std::array<float, 16> floats{}; // of the types made of floats
+    int integer = 0;                // of the others
+
+    friend bool operator==(UniformValue const& a, UniformValue const& b) {
+        return a.type == b.type && a.floats == b.floats && a.integer == b.integer;
+    }
+};
+std::ostream& operator<<(std::ostream& text, UniformValue const& value);
+
 // Knows its uniforms from the declarations in the sources; none of them is ever removed.
 class RecordingProgram final : public ObjectState, public IShaderProgram {
 public:
     static constexpr ObjectKind kKind = ObjectKind::Program;
 
-    RecordingProgram(int number_, int context_, char const* vertexSource, char const* fragmentSource);
+    RecordingProgram(int number_, int context_, char const* vertexSource, char const* fragmentSource,
+                     char const* label);
 
     void MakeCurrent() override;
     void Release() override;
     IParameterBinding* GetParameter(char const* name) override;
 
+    std::string const& GetLabel() const { return mLabel; }
+    // Its handles may outlive it.
+    bool MustStay() const override { return !released || liveParameters > 0; }
+
     int liveParameters = 0;
-    std::map<std::string, std::string> values; // those that were set, by the uniform's name
+    std::map<std::string, UniformValue> values; // those that were set, by the uniform's name
 
 private:
+    std::string const mLabel;
     std::map<std::string, BindingType> mTypes;
 };
 

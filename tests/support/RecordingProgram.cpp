@@ -19,32 +19,24 @@ BindingType ToBindingType(std::string const& glslType) {
     return found == kTypes.end() ? BindingTypeUnknown : found->second;
 }
 
-std::string JoinFloats(void const* value, int count) {
-    std::ostringstream text;
-    auto const* const numbers = static_cast<float const*>(value);
-    for (int i = 0; i < count; ++i) text << (i > 0 ? " " : "") << numbers[i];
-    return text.str();
-}
-
-std::string ToText(BindingType type, void const* value) {
+// 0 for the types that are not made of floats.
+std::size_t CountFloats(BindingType type) {
     switch (type) {
-    case BindingTypeUnknown:
-        return "ignored";
-    case BindingTypeBool:
-        return Join(*static_cast<bool const*>(value));
     case BindingTypeMatrix4:
-        return JoinFloats(value, 16);
+        return 16;
     case BindingTypeVector2:
-        return JoinFloats(value, 2);
+        return 2;
     case BindingTypeVector4:
-        return JoinFloats(value, 4);
+        return 4;
     case BindingTypeFloat:
-        return JoinFloats(value, 1);
+        return 1;
+    case BindingTypeUnknown:
+    case BindingTypeBool:
     case BindingTypeInt:
     case BindingTypeTextureUnit:
-        return Join(*static_cast<int const*>(value));
+        break;
     }
-    return {};
+    return 0;
 }
 
 class RecordingParameter final : public IParameterBinding {
@@ -58,17 +50,22 @@ public:
     ~RecordingParameter() override {
         Device& device = Device::Get();
         std::lock_guard<std::recursive_mutex> const lock(device.mutex);
-        device.Record(mProgram.GetName(), "ReleaseParameter", mName);
+        if (device.keepsRecords) device.Record(mProgram.GetName(), "ReleaseParameter", mName);
         if (device.attached && mProgram.context == device.context) {
             device.CheckThread(mProgram.GetName(), "ReleaseParameter");
         }
         --mProgram.liveParameters;
+        device.FreeIfUnused(mProgram);
     }
 
     void Set(void const* value) override {
-        std::string const text = ToText(GetType(), value);
-        Operation operation(mProgram, "SetParameter", Join(mName, text));
-        if (operation) mProgram.values[mName] = text;
+        UniformValue const next = UniformValue::Read(GetType(), value);
+        Operation operation(mProgram, "SetParameter", mName, next);
+        if (!operation) return;
+        auto const [known, isNew] = mProgram.values.try_emplace(mName, next);
+        if (!isNew && known->second == next) return;
+        known->second = next;
+        if (next.type != BindingTypeUnknown) ++operation->counters.uniformChanges;
     }
 
 private:
@@ -78,9 +75,37 @@ private:
 
 } // namespace
 
+UniformValue UniformValue::Read(BindingType type, void const* value) {
+    UniformValue result;
+    result.type = type;
+    if (type == BindingTypeBool) {
+        result.integer = *static_cast<bool const*>(value) ? 1 : 0;
+    } else if (type == BindingTypeInt || type == BindingTypeTextureUnit) {
+        result.integer = *static_cast<int const*>(value);
+    } else {
+        std::copy_n(static_cast<float const*>(value), CountFloats(type), result.floats.begin());
+    }
+    return result;
+}
+
+std::vector<float> UniformValue::GetNumbers() const {
+    if (type == BindingTypeUnknown) return {};
+    std::size_t const count = CountFloats(type);
+    if (count == 0) return {static_cast<float>(integer)};
+    return std::vector<float>(floats.data(), floats.data() + count);
+}
+
+std::ostream& operator<<(std::ostream& text, UniformValue const& value) {
+    if (value.type == BindingTypeUnknown) return text << "ignored";
+    std::size_t const count = CountFloats(value.type);
+    if (count == 0) return text << value.integer;
+    for (std::size_t i = 0; i < count; ++i) text << (i > 0 ? " " : "") << value.floats[i];
+    return text;
+}
+
 RecordingProgram::RecordingProgram(int number_, int context_, char const* vertexSource,
-                                   char const* fragmentSource)
-    : ObjectState(kKind, number_, context_) {
+                                   char const* fragmentSource, char const* label)
+    : ObjectState(kKind, number_, context_), mLabel(label) {
     for (char const* source : {vertexSource, fragmentSource}) {
         for (auto const& uniform : Moka::detail::FindGlslDeclarations(source, {"uniform"})) {
             mTypes[uniform.name] = ToBindingType(uniform.type);
@@ -90,20 +115,21 @@ RecordingProgram::RecordingProgram(int number_, int context_, char const* vertex
 
 void RecordingProgram::MakeCurrent() {
     Operation operation(*this, "MakeCurrent");
-    if (operation) operation->currentProgram = this;
+    if (!operation || operation->currentProgram == this) return;
+    operation->currentProgram = this;
+    ++operation->counters.programSwitches;
 }
 
 void RecordingProgram::Release() {
     Operation operation(*this, "Release");
-    if (released) return;
-    released = true;
     if (operation->currentProgram == this) operation->currentProgram = nullptr;
+    operation->EndObject(*this);
 }
 
 IParameterBinding* RecordingProgram::GetParameter(char const* name) {
     auto const found = mTypes.find(name);
     BindingType const type = found == mTypes.end() ? BindingTypeUnknown : found->second;
-    Operation operation(*this, "GetParameter", Join(name, static_cast<int>(type)));
+    Operation operation(*this, "GetParameter", name, static_cast<int>(type));
     return new RecordingParameter(*this, name, type);
 }
 

@@ -13,12 +13,6 @@ namespace {
 
 using DeviceLock = std::lock_guard<std::recursive_mutex>;
 
-// A released program stays as long as its handles do.
-bool MustStay(ObjectState const& object) {
-    return !object.released || (object.kind == ObjectKind::Program &&
-                                static_cast<RecordingProgram const&>(object).liveParameters > 0);
-}
-
 TextureState const& StateOf(ITextureObject const* texture) {
     return static_cast<RecordingTexture const*>(texture)->GetState();
 }
@@ -32,27 +26,20 @@ std::string ToString(RecordedCall const& call) {
 void RecordingRenderer::Reset() {
     Device& device = Device::Get();
     DeviceLock lock(device.mutex);
-    auto const live = std::stable_partition(device.objects.begin(), device.objects.end(),
-                                            [](auto const& object) { return MustStay(*object); });
-    for (auto released = live; released != device.objects.end(); ++released) {
-        if ((*released)->kind != ObjectKind::Texture) continue;
-        device.texturesByAddress.erase(static_cast<TextureState&>(**released).memory);
-    }
-    device.objects.erase(live, device.objects.end());
+    device.FreeReleased();
     device.attached = false;
     ++device.context; // what is still alive is left behind
     device.deviceMaxTextureSize = kDefaultMaxTextureSize;
     device.counters = {};
+    device.keepsRecords = true;
     device.calls.clear();
+    device.events.clear();
     device.violations.clear();
     device.creations = 0;
     device.failingCreations.clear();
     device.failingKinds.clear();
     device.lastNumber.clear();
-    device.active = nullptr;
-    device.currentProgram = nullptr;
-    device.boundTextures.clear();
-    device.host.reset();
+    device.ForgetState();
 }
 
 std::vector<RecordedCall> RecordingRenderer::GetCalls() {
@@ -177,7 +164,7 @@ std::string RecordingRenderer::GetParameter(IShaderProgram const* program, std::
     DeviceLock lock(Device::Get().mutex);
     auto const& values = static_cast<RecordingProgram const*>(program)->values;
     auto const found = values.find(name);
-    return found == values.end() ? std::string() : found->second;
+    return found == values.end() ? std::string() : Join(found->second);
 }
 
 std::string RecordingRenderer::GetBoundTexture(int unit) {

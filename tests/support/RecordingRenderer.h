@@ -2,15 +2,18 @@
 // keeps every image in memory, writes down each call, counts what is alive, fails where a test asks it to,
 // and notices misuse that a real driver would answer with a leak, a black picture or a crash much later.
 // Owner:   one per process, never destroyed. An object's memory is kept after its release until Reset(): so a
-//          second release, or a use after it, is caught instead of being undefined.
+//          second release, or a use after it, is caught instead of being undefined (see KeepRecords).
 // Thread:  everything here from any thread. The objects it makes belong to the declared render thread.
 // Images:  RGBA8. A texture keeps its rows in upload order; the host's frame buffer is in GL order, bottom
-//          row first. Nothing is blended, clipped or scaled.
+//          row first. Uploads, copies and clears change them; a clear obeys the scissor but no stencil.
+//          Draws do not: look at GetDraws().
 // Misuse:  an operation on another thread than the render thread, after release, or a second release; a
 //          depth-stencil buffer released while attached. A released object does nothing more, any other goes
 //          on: the test fails by looking at GetViolations(), not by crashing. Stricter than the interface in
 //          one point: deleting a texture off the render thread, which real renderers tolerate, counts too.
 #pragma once
+
+#include "tests/support/RecordingDraws.h"
 
 #include <string>
 #include <vector>
@@ -24,13 +27,21 @@ class ITextureObject;
 
 namespace Moka::Testing {
 
-enum class ObjectKind { Texture, RenderTarget, DepthStencilBuffer, Program };
+enum class ObjectKind {
+    Texture,
+    RenderTarget,
+    DepthStencilBuffer,
+    Program,
+    GraphicsObject,
+    BlendState,
+    DepthStencilState,
+};
 
 // One call. Objects are named by kind and number in order of creation: "texture 1", "target 1", "buffer 1",
-// "program 1"; static functions belong to "renderer". Operations are named as in the interfaces; the deletion
-// of a texture is its "Release", a creation is the new object's "Create"; what is done to a handle on a
-// parameter is an operation of its program: "program 1 SetParameter uFactor 0.5", "program 1 ReleaseParameter
-// uFactor".
+// "program 1", "graphics 1", "blend 1", "depthstencil 1"; static functions belong to "renderer", those of the
+// scissor to "rasterizer". Operations are named as in the interfaces; the deletion of a texture is its
+// "Release", a creation is the new object's "Create"; what is done to a handle on a parameter is an operation
+// of its program: "program 1 SetParameter uFactor 0.5", "program 1 ReleaseParameter uFactor".
 struct RecordedCall {
     std::string object;
     std::string operation;
@@ -50,6 +61,21 @@ public:
     // The calls as lines, which are then forgotten.
     static std::vector<std::string> TakeCalls();
     static int CountCalls(std::string const& operation);
+
+    // The draws and the clears, as values, in order; GetEvents() has both in their common order. A draw
+    // without a current program is none, one of no vertices is one.
+    static std::vector<RecordedDraw> GetDraws();
+    static std::vector<RecordedClear> GetClears();
+    static std::vector<RecordedEvent> GetEvents();
+    // The events, which are then forgotten.
+    static std::vector<RecordedEvent> TakeEvents();
+    // What a draw would find now.
+    static PipelineState GetState();
+
+    // Off, for long runs: calls and events are forgotten and kept no more, and a released object is freed at
+    // once, so that memory grows with the live objects only. A use after release is then undefined; other
+    // violations, statistics and live objects are known all the same. On again after Reset().
+    static void KeepRecords(bool keep);
 
     static std::vector<std::string> GetViolations();
 

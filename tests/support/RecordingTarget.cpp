@@ -13,9 +13,9 @@ unsigned char ToByte(float value) {
     return static_cast<unsigned char>(std::lround(std::min(value, 1.0f) * 255.0f));
 }
 
-void Fill(Surface& surface, int width, int height, unsigned char const (&color)[4]) {
-    for (int y = 0; y < std::min(height, surface.height); ++y) {
-        for (int x = 0; x < std::min(width, surface.width); ++x) std::memcpy(surface.At(x, y), color, 4);
+void Fill(Surface& surface, Rect const& rect, unsigned char const (&color)[4]) {
+    for (int y = rect.top; y < rect.bottom; ++y) {
+        for (int x = rect.left; x < rect.right; ++x) std::memcpy(surface.At(x, y), color, 4);
     }
 }
 
@@ -29,21 +29,18 @@ void RecordingTarget::Activate() {
 }
 
 void RecordingTarget::Deactivate(bool discardColor, bool discardDepthStencil) {
-    Operation operation(*this, "Deactivate", Join(discardColor, discardDepthStencil));
+    Operation operation(*this, "Deactivate", discardColor, discardDepthStencil);
     if (!operation || operation->active != this) return;
     operation->active = nullptr;
     ++operation->counters.frameBufferSwitches;
     // A driver may leave anything; a loud colour shows who reads it all the same.
-    if (discardColor) Fill(*mSurface, mWidth, mHeight, {0xFF, 0x00, 0xFF, 0xFF});
+    if (discardColor) Fill(*mSurface, Clip({0, 0, mWidth, mHeight}), {0xFF, 0x00, 0xFF, 0xFF});
 }
 
 void RecordingTarget::ReadPixels(int x, int y, int width, int height, PixelDestination const& destination) {
-    Operation operation(
-        *this, "ReadPixels",
-        Join(x, y, width, height, destination.rowLength, destination.skipRows, destination.skipPixels));
-    // A target made from the current frame buffer can claim more than that has.
-    Rect const inside = ClipBlock(x, y, width, height, std::min(mWidth, mSurface->width),
-                                  std::min(mHeight, mSurface->height));
+    Operation operation(*this, "ReadPixels", x, y, width, height, destination.rowLength, destination.skipRows,
+                        destination.skipPixels);
+    Rect const inside = Clip({x, y, width, height});
     if (!operation || !destination.pixels || inside == Rect()) return;
     auto const pitch =
         static_cast<std::ptrdiff_t>(destination.rowLength > 0 ? destination.rowLength : width) * 4;
@@ -59,17 +56,36 @@ void RecordingTarget::ReadPixels(int x, int y, int width, int height, PixelDesti
 
 void RecordingTarget::Release() {
     Operation operation(*this, "Release");
-    if (released) return;
-    released = true;
     mAttached = nullptr;
     if (operation->active == this) operation->active = nullptr;
+    operation->EndObject(*this);
+}
+
+Rect RecordingTarget::Clip(ScissorRect const& rect) const {
+    return ClipBlock(rect.x, rect.y, rect.width, rect.height, std::min(mWidth, mSurface->width),
+                     std::min(mHeight, mSurface->height));
+}
+
+RecordedClear RecordingTarget::DescribeClear(PipelineState const& state) const {
+    RecordedClear clear;
+    clear.state = state;
+    clear.target = GetName();
+    clear.buffer = RecordingRenderer::NameOf(mAttached);
+    return clear;
 }
 
 void RecordingTarget::ClearColor(float r, float g, float b, float a) {
-    Operation operation(*this, "ClearColor", Join(r, g, b, a));
+    Operation operation(*this, "ClearColor", r, g, b, a);
     if (!operation) return;
-    Fill(*mSurface, mWidth, mHeight, {ToByte(r), ToByte(g), ToByte(b), ToByte(a)});
+    PipelineState const& state = operation->state;
+    ScissorRect const rect = state.scissorOn ? state.scissor : ScissorRect{0, 0, mWidth, mHeight};
+    Fill(*mSurface, Clip(rect), {ToByte(r), ToByte(g), ToByte(b), ToByte(a)});
     ++operation->counters.clears;
+    if (!operation->keepsRecords) return;
+    RecordedClear clear = DescribeClear(state);
+    clear.clearsColor = true;
+    clear.color = {r, g, b, a};
+    operation->events.emplace_back(std::move(clear));
 }
 
 void RecordingTarget::AttachDepthStencil(IDepthStencilBuffer* buffer) {
@@ -94,14 +110,21 @@ void RecordingTarget::DetachDepthStencil() {
 }
 
 void RecordingTarget::ClearDepthStencil(bool clearDepth, float depth, bool clearStencil, int stencil) {
-    Operation operation(*this, "ClearDepthStencil", Join(clearDepth, depth, clearStencil, stencil));
-    if (operation && mAttached) ++operation->counters.clears;
+    Operation operation(*this, "ClearDepthStencil", clearDepth, depth, clearStencil, stencil);
+    if (!operation) return;
+    if (mAttached) ++operation->counters.clears;
+    if (!operation->keepsRecords) return;
+    RecordedClear clear = DescribeClear(operation->state);
+    clear.clearsDepth = clearDepth;
+    clear.depth = depth;
+    clear.clearsStencil = clearStencil;
+    clear.stencil = stencil;
+    operation->events.emplace_back(std::move(clear));
 }
 
 void RecordingBuffer::Release() {
     Operation operation(*this, "Release");
     if (released) return;
-    released = true;
     for (auto const& object : operation->objects) {
         if (object->kind != ObjectKind::RenderTarget) continue;
         auto& target = static_cast<RecordingTarget&>(*object);
@@ -109,6 +132,7 @@ void RecordingBuffer::Release() {
         operation->Violate(GetName() + " released while attached to " + target.GetName());
         target.Forget(this);
     }
+    operation->EndObject(*this);
 }
 
 } // namespace Moka::Testing::detail

@@ -37,6 +37,8 @@ TextureState::TextureState(int textureNumber, int textureContext, std::shared_pt
     Device::Get().texturesByAddress[memory] = this;
 }
 
+TextureState::~TextureState() { Device::Get().texturesByAddress.erase(memory); }
+
 bool TextureState::SetParameter(int id, int value) {
     bool const wrapping = id == TextureParamWrappingS || id == TextureParamWrappingT;
     bool const filtering = id == TextureParamFilteringMin || id == TextureParamFilteringMag;
@@ -78,7 +80,9 @@ RecordingTexture::~RecordingTexture() {
 void RecordingTexture::operator delete(void* memory) {
     Device& device = Device::Get();
     std::lock_guard<std::recursive_mutex> lock(device.mutex);
-    ::new (memory) RecordingTexture(*device.texturesByAddress.at(memory));
+    TextureState& state = *device.texturesByAddress.at(memory);
+    ::new (memory) RecordingTexture(state);
+    device.FreeIfUnused(state);
 }
 
 void RecordingTexture::SetLabel(char const* text) {
@@ -92,11 +96,15 @@ char const* RecordingTexture::GetLabel() const {
 }
 
 void RecordingTexture::Bind(int unit) {
-    if (Operation operation{mState, "Bind", Join(unit)}) operation->boundTextures[unit] = &mState;
+    if (Operation operation{mState, "Bind", unit}) {
+        TextureState const*& bound = operation->boundTextures[unit];
+        if (bound != &mState) ++operation->counters.textureSwitches;
+        bound = &mState;
+    }
 }
 
 void RecordingTexture::Replace(void const* pixels, int stride) {
-    Operation operation(mState, "Replace", Join(pixels ? "pixels" : "null", stride));
+    Operation operation(mState, "Replace", pixels ? "pixels" : "null", stride);
     if (!operation) return;
     Surface const& surface = *mState.surface;
     auto const bytes = static_cast<std::size_t>(stride > 0 ? stride : surface.width * 4);
@@ -105,7 +113,8 @@ void RecordingTexture::Replace(void const* pixels, int stride) {
 }
 
 void RecordingTexture::Replace(Rect const& rect, void const* pixels, int stride) {
-    Operation operation(mState, "Replace", Join(Join(rect), pixels ? "pixels" : "null", stride));
+    Operation operation(mState, "Replace", rect.left, rect.top, rect.right, rect.bottom,
+                        pixels ? "pixels" : "null", stride);
     if (!operation) return;
     auto const bytes =
         stride > 0 ? static_cast<std::size_t>(stride) : static_cast<std::size_t>(rect.GetWidth()) * 4;
@@ -120,7 +129,7 @@ void RecordingTexture::DrawToCurrent() {
 }
 
 void RecordingTexture::SetParameter(int id, int value) {
-    if (Operation operation{mState, "SetParameter", Join(id, value)}) mState.SetParameter(id, value);
+    if (Operation operation{mState, "SetParameter", id, value}) mState.SetParameter(id, value);
 }
 
 void RecordingTexture::CopyFromRenderTarget() {

@@ -4,12 +4,16 @@
 // Thread:  the render thread, except where a line says otherwise.
 #pragma once
 
+#include "moka/renderer/gles/GlCurrent.h"
 #include "moka/renderer/gles/GlDebug.h"
 #include "moka/renderer/gles/GlDepthStencilPool.h"
+#include "moka/renderer/gles/GlDrawList.h"
+#include "moka/renderer/gles/GlFill.h"
 #include "moka/renderer/gles/GlSamplers.h"
 #include "moka/renderer/gles/GlState.h"
 #include "moka/renderer/gles/GlStatistics.h"
 #include "moka/renderer/gles/GlTargetSwitch.h"
+#include "moka/renderer/gles/GlVertexFormats.h"
 
 #include <atomic>
 #include <mutex>
@@ -21,13 +25,28 @@ namespace Moka::detail {
 // What may be dropped on any thread.
 enum class GlNameKind { Texture, FrameBuffer, Program };
 
+// Vertices to be drawn with what is current.
+struct GlVertices {
+    PrimitiveType primitive;
+    int format;
+    int floatsPerVertex;
+    GLfloat const* data;
+    GLsizei count;
+};
+
 class GlContext {
 public:
     // On the render thread, which is the calling one, with the context current.
     explicit GlContext(RendererProcLoader loader);
+    ~GlContext();
+    GlContext(GlContext const&) = delete;
+    GlContext& operator=(GlContext const&) = delete;
 
-    // Deletes pooled and dropped names. What is dropped later goes down with the GL context.
+    // Plays the list, deletes pooled and dropped names. What is dropped later goes down with the GL context.
     void Detach();
+
+    // The one that is attached, or null. For the render thread, where it cannot go meanwhile.
+    static GlContext* GetAttached();
 
     // Any thread.
     bool IsAttached() const { return mAttached; }
@@ -40,19 +59,43 @@ public:
 
     // What GlOperation does. False: the context is detached, GL must not be called.
     bool Enter();
-    void Leave() { targets.Settle(); }
+    void Leave();
+
+    // Within an operation: adds a draw to the list. False when nothing can be drawn.
+    bool Draw(GlVertices const& vertices);
+    // Within an operation, after anything else was added to the list: it is played at once unless it waits
+    // for more.
+    void AfterAdding();
+    void Play();
+    // Within an operation: what the list does with it happens before what the caller is about to do.
+    void PlayIfUsed(GlTextureStorage const& storage);
+    // Within an operation: nothing refers to it any more.
+    void LetGo(GlUniforms const& program);
+
+    // Within an operation: whether what is asked for reaches GL at once, because nothing that comes first
+    // waits in the list.
+    bool IsThrough() const { return (mIsForeign || !targets.IsDeferred()) && list.IsEmpty(); }
+
+    // Within an operation.
+    void Activate(GlRenderTarget& target);
+    void Deactivate(GlRenderTarget const& target);
 
     // Before foreign GL and after it.
     void Flush();
+    void Commit();
     void InvalidateState();
     void SetDeferred(bool on);
 
     GlStatistics statistics;
-    GlState state;
+    GlState state{statistics};
     GlDebug debug{statistics};
-    GlTargetSwitch targets{state, statistics};
+    GlTargetSwitch targets{state};
     GlSamplers samplers{state, statistics};
-    GlDepthStencilPool depthStencilPool{state, debug, statistics};
+    GlDepthStencilPool depthStencilPool{state, targets, debug};
+    GlVertexFormats vertexFormats{state};
+    GlFill fill;
+    GlCurrent current{state};
+    GlDrawList list;
 
 private:
     struct Orphan {
@@ -62,12 +105,20 @@ private:
 
     void Delete(Orphan const& orphan);
     void DeleteOrphans();
+    void ClearIdleSamplers();
+    void BindActive();
+    GlTargetUse GetDrawTarget();
+    void CopySampledTarget(GlDrawState& drawState);
 
     std::thread::id const mRenderThread = std::this_thread::get_id();
     std::atomic<bool> mAttached{true};
     std::atomic<bool> mHasOrphans{false};
     std::mutex mOrphanLock;
     std::vector<Orphan> mOrphans;
+    // Between a commit and the invalidation, while GL is foreign code's.
+    bool mIsForeign = false;
+    // What a draw samples in the place of its own target; kept while the same size is asked for.
+    std::shared_ptr<GlTextureStorage> mTargetCopy;
 };
 
 // GlOperation: the frame of every operation that may call GL: checks the thread, deletes what was dropped

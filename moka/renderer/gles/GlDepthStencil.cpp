@@ -24,7 +24,10 @@ void GlDepthStencil::Release() {
     std::shared_ptr<GlContext> const context = mContext;
     GlOperation const operation(*context);
     if (mTarget) mTarget->Detach();
-    if (operation) context->depthStencilPool.Give(mName, mWidth, mHeight);
+    if (operation) {
+        if (context->depthStencilPool.IsFull()) context->Play();
+        context->depthStencilPool.Give(mName, mWidth, mHeight);
+    }
     delete this;
 }
 

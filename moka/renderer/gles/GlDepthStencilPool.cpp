@@ -1,8 +1,11 @@
 #include "moka/renderer/gles/GlDepthStencilPool.h"
 
 #include "moka/renderer/gles/GlDebug.h"
+#include "moka/renderer/gles/GlDrawState.h"
+#include "moka/renderer/gles/GlFrameBuffer.h"
 #include "moka/renderer/gles/GlState.h"
 #include "moka/renderer/gles/GlStatistics.h"
+#include "moka/renderer/gles/GlTargetSwitch.h"
 
 #include <algorithm>
 
@@ -15,8 +18,8 @@ GLuint GlDepthStencilPool::Take(int width, int height) {
     if (found != mWaiting.rend()) {
         GLuint const name = found->name;
         mWaiting.erase(std::next(found).base());
-        --mStatistics.pooledRenderBuffers;
-        ++mStatistics.renderBuffers;
+        --mState.statistics.pooledRenderBuffers;
+        ++mState.statistics.renderBuffers;
         return name;
     }
     GLuint name = 0;
@@ -27,13 +30,13 @@ GLuint GlDepthStencilPool::Take(int width, int height) {
         glDeleteRenderbuffers(1, &name);
         return 0;
     }
-    ++mStatistics.renderBuffers;
+    ++mState.statistics.renderBuffers;
     return name;
 }
 
 void GlDepthStencilPool::Give(GLuint name, int width, int height) {
-    --mStatistics.renderBuffers;
-    ++mStatistics.pooledRenderBuffers;
+    --mState.statistics.renderBuffers;
+    ++mState.statistics.pooledRenderBuffers;
     mWaiting.push_back({name, width, height});
     if (mWaiting.size() > kMaxWaiting) DeleteOldest();
 }
@@ -42,10 +45,36 @@ void GlDepthStencilPool::Clear() {
     while (!mWaiting.empty()) DeleteOldest();
 }
 
+void GlDepthStencilPool::Attach(GlTargetUse const& target) {
+    GlFrameBuffer& frameBuffer = *target.frameBuffer;
+    if (frameBuffer.depthStencil == target.depthStencil) return;
+    AttachTo(frameBuffer, target.depthStencil);
+}
+
+// Through the reading side, which is free when the target is bound and otherwise leaves the drawing side
+// alone.
+void GlDepthStencilPool::AttachTo(GlFrameBuffer& frameBuffer, GLuint name) {
+    mTargets.BindRead(frameBuffer.GetName());
+    glFramebufferRenderbuffer(GL_READ_FRAMEBUFFER, GL_DEPTH_STENCIL_ATTACHMENT, GL_RENDERBUFFER, name);
+    Forget(frameBuffer);
+    frameBuffer.depthStencil = name;
+    if (name != 0) mHolders.push_back(&frameBuffer);
+}
+
+void GlDepthStencilPool::Forget(GlFrameBuffer const& frameBuffer) {
+    mHolders.erase(std::remove(mHolders.begin(), mHolders.end(), &frameBuffer), mHolders.end());
+}
+
+// One that stays attached would live on without a name.
 void GlDepthStencilPool::DeleteOldest() {
-    glDeleteRenderbuffers(1, &mWaiting.front().name);
+    GLuint const name = mWaiting.front().name;
     mWaiting.pop_front();
-    --mStatistics.pooledRenderBuffers;
+    std::vector<GlFrameBuffer*> const holders = mHolders;
+    for (GlFrameBuffer* const holder : holders) {
+        if (holder->depthStencil == name) AttachTo(*holder, 0);
+    }
+    glDeleteRenderbuffers(1, &name);
+    --mState.statistics.pooledRenderBuffers;
 }
 
 } // namespace Moka::detail

@@ -1,5 +1,6 @@
 #include "moka/renderer/gles/GlFrameBuffer.h"
 
+#include "moka/renderer/gles/GlContext.h"
 #include "moka/renderer/gles/GlTextureStorage.h"
 
 #include <utility>
@@ -19,8 +20,16 @@ std::shared_ptr<GlFrameBuffer> GlFrameBuffer::OfHost(GLuint name) {
 GlFrameBuffer::GlFrameBuffer(GLuint name, std::shared_ptr<GlTextureStorage> storage)
     : mName(name), mStorage(std::move(storage)) {}
 
+// One with a render buffer attached is of no use to the storage.
 GlFrameBuffer::~GlFrameBuffer() {
-    if (mStorage) mStorage->GiveFrameBuffer(mName);
+    if (!mStorage) return;
+    if (depthStencil == 0) {
+        mStorage->GiveFrameBuffer(mName);
+        return;
+    }
+    GlContext& context = *mStorage->GetContext();
+    context.depthStencilPool.Forget(*this);
+    context.Drop(GlNameKind::FrameBuffer, mName);
 }
 
 } // namespace Moka::detail

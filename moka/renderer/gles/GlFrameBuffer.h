@@ -23,7 +23,10 @@ public:
 
     GLuint GetName() const { return mName; }
     // Null for the host's.
-    GlTextureStorage const* GetStorage() const { return mStorage.get(); }
+    GlTextureStorage* GetStorage() const { return mStorage.get(); }
+
+    // The render buffer that is attached in GL, 0 for none; GlDepthStencilPool's to change.
+    GLuint depthStencil = 0;
 
 private:
     GlFrameBuffer(GLuint name, std::shared_ptr<GlTextureStorage> storage);

@@ -26,12 +26,17 @@ private:
 GlProgram::GlProgram(std::shared_ptr<GlContext> const& context, char const* vertexSource,
                      char const* fragmentSource, char const* name) {
     char const* const label = name ? name : "";
-    GLuint const program = context ? BuildGlProgram(*context, vertexSource, fragmentSource, label) : 0;
-    if (program != 0) context->debug.Label(GL_PROGRAM_KHR, program, label);
-    mUniforms = std::make_shared<GlUniforms>(context, program, label);
+    GlBuiltProgram const built =
+        context ? BuildGlProgram(*context, vertexSource, fragmentSource, label) : GlBuiltProgram{};
+    if (built.name != 0) {
+        ++context->statistics.programs;
+        context->debug.Label(GL_PROGRAM_KHR, built.name, label);
+    }
+    mUniforms = std::make_shared<GlUniforms>(context, built.name, label);
+    if (built.isPlaceholder) mUniforms->SetPlaceholder();
 }
 
-void GlProgram::MakeCurrent() { mUniforms->MakeCurrent(); }
+void GlProgram::MakeCurrent() { mUniforms->MakeCurrent(mUniforms); }
 
 void GlProgram::Release() {
     mUniforms->DeleteProgram();

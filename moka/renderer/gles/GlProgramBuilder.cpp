@@ -102,18 +102,17 @@ GLuint Link(char const* vertexSource, char const* fragmentSource, std::string* f
 
 } // namespace
 
-GLuint BuildGlProgram(GlContext& context, char const* vertexSource, char const* fragmentSource,
-                      char const* name) {
+GlBuiltProgram BuildGlProgram(GlContext& context, char const* vertexSource, char const* fragmentSource,
+                              char const* name) {
     std::string failure;
-    GLuint program = Link(vertexSource, fragmentSource, &failure);
-    if (program == 0) {
+    GlBuiltProgram program{Link(vertexSource, fragmentSource, &failure), false};
+    if (program.name == 0) {
         ++context.statistics.errors;
         __android_log_print(ANDROID_LOG_ERROR, "mok_log",
                             "RendererFactory::CreateShaderProgram: %s draws nothing: %s", name,
                             failure.c_str());
-        program = Link(kVertexOutside, kFragmentNever, &failure);
+        program = {Link(kVertexOutside, kFragmentNever, &failure), true};
     }
-    if (program != 0) ++context.statistics.programs;
     return program;
 }
 

@@ -9,16 +9,6 @@
 #include <utility>
 
 namespace Moka::detail {
-namespace {
-
-// Through the reading side, which is free when the target is the active one and otherwise leaves the drawing
-// side alone.
-void AttachToReadTarget(GLuint renderBuffer) {
-    glFramebufferRenderbuffer(GL_READ_FRAMEBUFFER, GL_DEPTH_STENCIL_ATTACHMENT, GL_RENDERBUFFER,
-                              renderBuffer);
-}
-
-} // namespace
 
 GlRenderTarget::GlRenderTarget(std::shared_ptr<GlContext> context, std::shared_ptr<GlFrameBuffer> frameBuffer,
                                int width, int height)
@@ -30,32 +20,24 @@ GlRenderTarget::~GlRenderTarget() { --mContext->statistics.renderTargets; }
 
 GLuint GlRenderTarget::GetName() const { return mFrameBuffer->GetName(); }
 
-GlTextureStorage const* GlRenderTarget::GetStorage() const { return mFrameBuffer->GetStorage(); }
+GlTextureStorage* GlRenderTarget::GetStorage() const { return mFrameBuffer->GetStorage(); }
+
+GlTargetUse GlRenderTarget::GetUse() const {
+    return {mFrameBuffer, mWidth, mHeight, mDepthStencil ? mDepthStencil->GetName() : 0};
+}
 
 void GlRenderTarget::Activate() {
     GlOperation const operation(*mContext);
-    if (operation) mContext->targets.Activate(*this);
+    if (operation) mContext->Activate(*this);
 }
 
 void GlRenderTarget::Deactivate(bool discardColor, bool discardDepthStencil) {
     GlOperation const operation(*mContext);
     if (!operation || mContext->targets.GetActive() != this) return;
-    if (discardColor || discardDepthStencil) Discard(discardColor, discardDepthStencil);
-    mContext->targets.Deactivate(*this);
-}
-
-// A frame buffer object and the default frame buffer have different names for their parts.
-void GlRenderTarget::Discard(bool color, bool depthStencil) const {
-    bool const isObject = GetName() != 0;
-    GLenum parts[3] = {};
-    GLsizei count = 0;
-    if (color) parts[count++] = isObject ? GL_COLOR_ATTACHMENT0 : GL_COLOR;
-    if (depthStencil) {
-        parts[count++] = isObject ? GL_DEPTH_ATTACHMENT : GL_DEPTH;
-        parts[count++] = isObject ? GL_STENCIL_ATTACHMENT : GL_STENCIL;
+    if (discardColor || discardDepthStencil) {
+        mContext->list.Add(GlDiscard{GetUse(), discardColor, discardDepthStencil});
     }
-    mContext->targets.BindDraw(GetName());
-    glInvalidateFramebuffer(GL_DRAW_FRAMEBUFFER, count, parts);
+    mContext->Deactivate(*this);
 }
 
 void GlRenderTarget::ReadPixels(int x, int y, int width, int height, PixelDestination const& destination) {
@@ -73,6 +55,7 @@ void GlRenderTarget::ReadPixels(int x, int y, int width, int height, PixelDestin
     if (block.width == 0) return;
     block.skippedRows += destination.skipRows;
     block.skippedPixels += destination.skipPixels;
+    mContext->Play();
     mContext->targets.BindRead(GetName());
     ReadBackPixels(mContext->state, block, destination.pixels, rowLength);
     mContext->statistics.bytesReadBack += block.GetBytes();
@@ -84,21 +67,27 @@ void GlRenderTarget::Release() {
     std::shared_ptr<GlContext> const context = mContext;
     GlOperation const operation(*context);
     Detach();
-    if (operation) context->targets.Deactivate(*this);
+    if (operation) {
+        context->Deactivate(*this);
+        if (context->list.IsEmpty()) context->current.LetGo();
+    }
     delete this;
 }
 
 void GlRenderTarget::ClearColor(float r, float g, float b, float a) {
     GlOperation const operation(*mContext);
     if (!operation) return;
-    mContext->targets.BindDraw(GetName());
-    GlOverride<GlObstaclesAccess> const obstacles(mContext->state.obstacles, 0);
-    GlOverride<GlColorMaskAccess> const mask(mContext->state.colorMask, kGlAllColors);
-    // Unlike glClear it needs no clear colour, which foreign code may have set for itself.
-    GLfloat const color[4] = {r, g, b, a};
-    glClearBufferfv(GL_COLOR, 0, color);
-    ++mContext->statistics.clears;
+    std::array<GLfloat, 4> const color{r, g, b, a};
+    if (mContext->current.GetDepthStencil().IsStencil() && HasStencil()) {
+        mContext->fill.Add(mContext, GetUse(), color);
+    } else {
+        mContext->list.Add(GlColorClear{GetUse(), mContext->current.GetScissor(), color});
+    }
+    mContext->AfterAdding();
 }
+
+// A host's frame buffer may or may not have one; drawing is right either way.
+bool GlRenderTarget::HasStencil() const { return mDepthStencil || !GetStorage(); }
 
 void GlRenderTarget::AttachDepthStencil(IDepthStencilBuffer* buffer) {
     GlOperation const operation(*mContext);
@@ -110,8 +99,6 @@ void GlRenderTarget::AttachDepthStencil(IDepthStencilBuffer* buffer) {
     if (GlRenderTarget* const other = wanted->GetTarget()) other->Detach();
     mDepthStencil = wanted;
     wanted->SetTarget(this);
-    mContext->targets.BindRead(GetName());
-    AttachToReadTarget(wanted->GetName());
 }
 
 bool GlRenderTarget::MayAttach(GlDepthStencil const& buffer) const {
@@ -135,25 +122,14 @@ void GlRenderTarget::Detach() {
     if (!mDepthStencil) return;
     mDepthStencil->SetTarget(nullptr);
     mDepthStencil = nullptr;
-    if (!mContext->IsAttached()) return;
-    mContext->targets.BindRead(GetName());
-    AttachToReadTarget(0);
 }
 
 void GlRenderTarget::ClearDepthStencil(bool clearDepth, float depth, bool clearStencil, int stencil) {
     GlOperation const operation(*mContext);
     if (!operation || !mDepthStencil || (!clearDepth && !clearStencil)) return;
-    mContext->targets.BindDraw(GetName());
-    GlOverride<GlObstaclesAccess> const obstacles(mContext->state.obstacles, 0);
-    GlOverride<GlDepthStencilMaskAccess> const mask(mContext->state.depthStencilMask, kGlAllDepthStencil);
-    if (clearDepth && clearStencil) {
-        glClearBufferfi(GL_DEPTH_STENCIL, 0, depth, stencil);
-    } else if (clearDepth) {
-        glClearBufferfv(GL_DEPTH, 0, &depth);
-    } else {
-        glClearBufferiv(GL_STENCIL, 0, &stencil);
-    }
-    ++mContext->statistics.clears;
+    mContext->list.Add(GlDepthStencilClear{GetUse(), mContext->current.GetScissor(), clearDepth, clearStencil,
+                                           depth, stencil});
+    mContext->AfterAdding();
 }
 
 } // namespace Moka::detail

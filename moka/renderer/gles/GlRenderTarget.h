@@ -2,8 +2,7 @@
 #pragma once
 
 #include "moka/renderer/IRenderTarget.h"
-
-#include <GLES3/gl3.h>
+#include "moka/renderer/gles/GlDrawState.h"
 
 #include <memory>
 
@@ -11,8 +10,6 @@ namespace Moka::detail {
 
 class GlContext;
 class GlDepthStencil;
-class GlFrameBuffer;
-class GlTextureStorage;
 
 class GlRenderTarget final : public IRenderTarget {
 public:
@@ -35,15 +32,17 @@ public:
     int GetWidth() const { return mWidth; }
     int GetHeight() const { return mHeight; }
     // Null for a host's frame buffer.
-    GlTextureStorage const* GetStorage() const;
+    GlTextureStorage* GetStorage() const;
+    // As a command in the draw list names it.
+    GlTargetUse GetUse() const;
     std::shared_ptr<GlFrameBuffer> const& GetFrameBuffer() const { return mFrameBuffer; }
 
-    // Within an operation: no depth-stencil buffer afterwards.
+    // No depth-stencil buffer afterwards. Commands in the draw list name the one they were made with.
     void Detach();
 
 private:
     bool MayAttach(GlDepthStencil const& buffer) const;
-    void Discard(bool color, bool depthStencil) const;
+    bool HasStencil() const;
 
     std::shared_ptr<GlContext> const mContext;
     std::shared_ptr<GlFrameBuffer> const mFrameBuffer;

@@ -5,6 +5,8 @@
 // Thread: render thread.
 #pragma once
 
+#include "moka/renderer/gles/GlStatistics.h"
+
 #include <optional>
 
 namespace Moka::detail {
@@ -14,8 +16,13 @@ class GlShadow {
 public:
     using Value = typename Access::Value;
 
+    explicit GlShadow(GlStatistics& statistics) : mStatistics(statistics) {}
+
     Value const& Get() {
-        if (!mValue) mValue = Access::Query();
+        if (!mValue) {
+            mValue = Access::Query();
+            ++mStatistics.queries;
+        }
         return *mValue;
     }
 
@@ -33,6 +40,7 @@ public:
     Value* Known() { return mValue ? &*mValue : nullptr; }
 
 private:
+    GlStatistics& mStatistics;
     std::optional<Value> mValue;
 };
 

@@ -1,5 +1,8 @@
 #include "moka/renderer/gles/GlState.h"
 
+#include "moka/renderer/gles/GlStatistics.h"
+#include "moka/renderer/gles/GlTables.h"
+
 #include <algorithm>
 #include <iterator>
 
@@ -14,8 +17,15 @@ GLint QueryInteger(GLenum name) {
 
 GLuint QueryName(GLenum name) { return static_cast<GLuint>(QueryInteger(name)); }
 
+GlBox QueryBox(GLenum name) {
+    GLint v[4] = {};
+    glGetIntegerv(name, v);
+    return {v[0], v[1], v[2], v[3]};
+}
+
+// The first one has a name of its own.
 constexpr GLenum kObstacles[] = {
-    GL_CULL_FACE,       GL_DEPTH_TEST,        GL_DITHER, GL_POLYGON_OFFSET_FILL, GL_SAMPLE_ALPHA_TO_COVERAGE,
+    GL_DEPTH_TEST,      GL_CULL_FACE,         GL_DITHER, GL_POLYGON_OFFSET_FILL, GL_SAMPLE_ALPHA_TO_COVERAGE,
     GL_SAMPLE_COVERAGE, GL_RASTERIZER_DISCARD};
 
 } // namespace
@@ -35,14 +45,16 @@ void GlFrameBuffersAccess::Apply(Value const& value, Value const* known) {
     if (read) glBindFramebuffer(GL_READ_FRAMEBUFFER, value.read);
 }
 
-GlViewport GlViewportAccess::Query() {
-    GLint v[4] = {};
-    glGetIntegerv(GL_VIEWPORT, v);
-    return {v[0], v[1], v[2], v[3]};
-}
+GlBox GlViewportAccess::Query() { return QueryBox(GL_VIEWPORT); }
 
 void GlViewportAccess::Apply(Value const& value, Value const*) {
     glViewport(value.x, value.y, value.width, value.height);
+}
+
+GlBox GlScissorRectAccess::Query() { return QueryBox(GL_SCISSOR_BOX); }
+
+void GlScissorRectAccess::Apply(Value const& value, Value const*) {
+    glScissor(value.x, value.y, value.width, value.height);
 }
 
 bool GlScissorTestAccess::Query() { return glIsEnabled(GL_SCISSOR_TEST) == GL_TRUE; }
@@ -107,7 +119,9 @@ GLuint GlProgramAccess::Query() { return QueryName(GL_CURRENT_PROGRAM); }
 
 void GlProgramAccess::Apply(GLuint value, GLuint const*) { glUseProgram(value); }
 
-GlState::GlState() : mUnits(static_cast<std::size_t>(QueryInteger(GL_MAX_COMBINED_TEXTURE_IMAGE_UNITS))) {
+GlState::GlState(GlStatistics& counters)
+    : statistics(counters),
+      mUnits(static_cast<std::size_t>(QueryInteger(GL_MAX_COMBINED_TEXTURE_IMAGE_UNITS))) {
     mSamplerUnits.reserve(mUnits.size());
 }
 
@@ -115,15 +129,53 @@ void GlState::Invalidate() {
     frameBuffers.Forget();
     viewport.Forget();
     scissorTest.Forget();
+    scissorRect.Forget();
     colorMask.Forget();
     depthStencilMask.Forget();
     obstacles.Forget();
     activeUnit.Forget();
     renderBuffer.Forget();
     program.Forget();
+    blend.Forget();
+    stencil.Forget();
+    vertexArray.Forget();
+    arrayBuffer.Forget();
     unpack.Forget();
     pack.Forget();
     std::fill(mUnits.begin(), mUnits.end(), Unit{});
+}
+
+void GlState::SetScissorTest(bool on) {
+    if (scissorTest.Set(on)) ++statistics.scissorChanges;
+}
+
+void GlState::SetScissorRect(GlBox const& box) {
+    if (scissorRect.Set(box)) ++statistics.scissorChanges;
+}
+
+void GlState::SetBlend(BlendStateDescriptor const& descriptor) {
+    if (blend.Set(ToGlBlend(descriptor))) ++statistics.blendChanges;
+    GLboolean const write = descriptor.IsColorWrite() ? GL_TRUE : GL_FALSE;
+    if (colorMask.Set({write, write, write, write})) ++statistics.blendChanges;
+}
+
+// The masks hold while a test is on; otherwise they are left as they are.
+void GlState::SetDepthStencil(DepthStencilStateDescriptor const& descriptor) {
+    bool const depth = descriptor.IsDepth();
+    if (obstacles.Set(depth ? GlObstaclesAccess::kDepthTest : 0)) {
+        ++statistics.depthStencilChanges;
+        if (depth) glDepthFunc(GL_LESS);
+    }
+    if (stencil.Set(ToGlStencil(descriptor))) ++statistics.depthStencilChanges;
+    if (!depth && !descriptor.IsStencil()) return;
+    GLuint const mask = descriptor.IsStencil() ? descriptor.GetWriteMask() : 0;
+    if (depthStencilMask.Set({depth ? GLboolean{GL_TRUE} : GLboolean{GL_FALSE}, mask, mask})) {
+        ++statistics.depthStencilChanges;
+    }
+}
+
+void GlState::SetProgram(GLuint name) {
+    if (program.Set(name)) ++statistics.programSwitches;
 }
 
 void GlState::BindTexture(int unit, GLuint texture, GLuint sampler) {
@@ -133,8 +185,10 @@ void GlState::BindTexture(int unit, GLuint texture, GLuint sampler) {
         GlOverride<GlActiveUnitAccess> const active(activeUnit, unit);
         glBindTexture(GL_TEXTURE_2D, texture);
         bound.texture = texture;
+        ++statistics.textureSwitches;
     }
     if (bound.sampler == sampler) return;
+    ++statistics.textureSwitches;
     glBindSampler(static_cast<GLuint>(unit), sampler);
     bound.sampler = sampler;
     if (std::find(mSamplerUnits.begin(), mSamplerUnits.end(), unit) == mSamplerUnits.end()) {
@@ -160,6 +214,14 @@ void GlState::ForgetSampler(GLuint sampler) {
     for (Unit& unit : mUnits) {
         if (unit.sampler == sampler) unit.sampler = 0;
     }
+}
+
+void GlState::ForgetVertexArray(GLuint name) {
+    if (GLuint* const bound = vertexArray.Known(); bound && *bound == name) *bound = 0;
+}
+
+void GlState::ForgetArrayBuffer(GLuint name) {
+    if (GLuint* const bound = arrayBuffer.Known(); bound && *bound == name) *bound = 0;
 }
 
 void GlState::ForgetFrameBuffer(GLuint frameBuffer) {

@@ -3,6 +3,8 @@
 // Does not know what the state is for: who draws where is GlTargetSwitch's business.
 #pragma once
 
+#include "moka/renderer/IRasterizerState.h"
+#include "moka/renderer/gles/GlDrawAccess.h"
 #include "moka/renderer/gles/GlPixelStore.h"
 #include "moka/renderer/gles/GlShadow.h"
 
@@ -10,7 +12,14 @@
 
 #include <vector>
 
+namespace Moka {
+class BlendStateDescriptor;
+class DepthStencilStateDescriptor;
+} // namespace Moka
+
 namespace Moka::detail {
+
+struct GlStatistics;
 
 struct GlFrameBuffersAccess {
     struct Value {
@@ -25,17 +34,25 @@ struct GlFrameBuffersAccess {
 };
 using GlFrameBuffers = GlFrameBuffersAccess::Value;
 
+// In pixels of the frame buffer, from GL's origin.
+struct GlBox {
+    GLint x = 0, y = 0, width = 0, height = 0;
+    friend bool operator==(GlBox const& a, GlBox const& b) {
+        return a.x == b.x && a.y == b.y && a.width == b.width && a.height == b.height;
+    }
+};
+
 struct GlViewportAccess {
-    struct Value {
-        GLint x, y, width, height;
-        friend bool operator==(Value const& a, Value const& b) {
-            return a.x == b.x && a.y == b.y && a.width == b.width && a.height == b.height;
-        }
-    };
+    using Value = GlBox;
     static Value Query();
     static void Apply(Value const& value, Value const* known);
 };
-using GlViewport = GlViewportAccess::Value;
+
+struct GlScissorRectAccess {
+    using Value = GlBox;
+    static Value Query();
+    static void Apply(Value const& value, Value const* known);
+};
 
 struct GlScissorTestAccess {
     using Value = bool;
@@ -69,10 +86,11 @@ struct GlDepthStencilMaskAccess {
 };
 inline constexpr GlDepthStencilMaskAccess::Value kGlAllDepthStencil{GL_TRUE, 0xFFu, 0xFFu};
 
-// What must be off for everything the renderer does, a bit for each that is on: nothing is culled, tested for
-// depth, dithered, offset, covered by samples, or thrown away before the rasterizer.
+// What must be off for everything the renderer does, a bit for each that is on: nothing is culled, dithered,
+// offset, covered by samples, or thrown away before the rasterizer, nor tested for depth unless a state asks.
 struct GlObstaclesAccess {
     using Value = unsigned;
+    static constexpr Value kDepthTest = 1u;
     static Value Query();
     static void Apply(Value value, Value const* known);
 };
@@ -98,22 +116,36 @@ struct GlProgramAccess {
 class GlState {
 public:
     // Reads the number of texture units from the current context.
-    GlState();
+    explicit GlState(GlStatistics& statistics);
 
     // Somebody else may have changed anything.
     void Invalidate();
 
-    GlShadow<GlFrameBuffersAccess> frameBuffers;
-    GlShadow<GlViewportAccess> viewport;
-    GlShadow<GlScissorTestAccess> scissorTest;
-    GlShadow<GlColorMaskAccess> colorMask;
-    GlShadow<GlDepthStencilMaskAccess> depthStencilMask;
-    GlShadow<GlObstaclesAccess> obstacles;
-    GlShadow<GlActiveUnitAccess> activeUnit;
-    GlShadow<GlRenderBufferAccess> renderBuffer;
-    GlShadow<GlProgramAccess> program;
-    GlShadow<GlPixelStoreAccess<GlUnpackNames>> unpack;
-    GlShadow<GlPixelStoreAccess<GlPackNames>> pack;
+    // What a draw is made under; each counts what it changes.
+    void SetScissorTest(bool on);
+    void SetScissorRect(GlBox const& box);
+    void SetBlend(BlendStateDescriptor const& blend);
+    void SetDepthStencil(DepthStencilStateDescriptor const& depthStencil);
+    void SetProgram(GLuint name);
+
+    GlStatistics& statistics;
+
+    GlShadow<GlFrameBuffersAccess> frameBuffers{statistics};
+    GlShadow<GlViewportAccess> viewport{statistics};
+    GlShadow<GlScissorTestAccess> scissorTest{statistics};
+    GlShadow<GlScissorRectAccess> scissorRect{statistics};
+    GlShadow<GlColorMaskAccess> colorMask{statistics};
+    GlShadow<GlDepthStencilMaskAccess> depthStencilMask{statistics};
+    GlShadow<GlObstaclesAccess> obstacles{statistics};
+    GlShadow<GlActiveUnitAccess> activeUnit{statistics};
+    GlShadow<GlRenderBufferAccess> renderBuffer{statistics};
+    GlShadow<GlProgramAccess> program{statistics};
+    GlShadow<GlBlendAccess> blend{statistics};
+    GlShadow<GlStencilAccess> stencil{statistics};
+    GlShadow<GlVertexArrayAccess> vertexArray{statistics};
+    GlShadow<GlArrayBufferAccess> arrayBuffer{statistics};
+    GlShadow<GlPixelStoreAccess<GlUnpackNames>> unpack{statistics};
+    GlShadow<GlPixelStoreAccess<GlPackNames>> pack{statistics};
 
     // Units for sampling are 0 up to this number. The one after them is kept for uploads and copies, so that
     // what foreign code and draws have bound stays bound.
@@ -126,6 +158,8 @@ public:
     // GL undoes the bindings of what is deleted; so does the shadow.
     void ForgetTexture(GLuint texture);
     void ForgetSampler(GLuint sampler);
+    void ForgetVertexArray(GLuint name);
+    void ForgetArrayBuffer(GLuint name);
     void ForgetFrameBuffer(GLuint frameBuffer);
     // Ahead of its deletion, which a current program survives.
     void TakeOffProgram(GLuint name);

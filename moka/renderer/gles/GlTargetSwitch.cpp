@@ -1,44 +1,48 @@
 #include "moka/renderer/gles/GlTargetSwitch.h"
 
+#include "moka/renderer/gles/GlDrawState.h"
+#include "moka/renderer/gles/GlFrameBuffer.h"
 #include "moka/renderer/gles/GlRenderTarget.h"
 #include "moka/renderer/gles/GlStatistics.h"
 
 namespace Moka::detail {
+namespace {
 
-void GlTargetSwitch::Activate(GlRenderTarget& target) {
-    mActive = &target;
-    Settle();
+// Remembers what the host has, the first time.
+template <class Shadow, class Saved>
+void Take(Shadow& shadow, Saved& saved) {
+    if (!saved) saved = shadow.Get();
 }
 
-void GlTargetSwitch::Deactivate(GlRenderTarget const& target) {
-    if (mActive != &target) return;
-    mActive = nullptr;
-    if (!mDeferred) GiveBack();
+template <class Shadow, class Saved>
+void Return(Shadow& shadow, Saved& saved) {
+    if (saved) shadow.Set(*saved);
+    saved.reset();
 }
+
+} // namespace
 
 void GlTargetSwitch::BindDraw(GLuint frameBuffer) { Bind({frameBuffer, mState.frameBuffers.Get().read}); }
 
 void GlTargetSwitch::BindRead(GLuint frameBuffer) { Bind({mState.frameBuffers.Get().draw, frameBuffer}); }
 
 void GlTargetSwitch::Bind(GlFrameBuffers const& wanted) {
-    if (!mHostFrameBuffers) mHostFrameBuffers = mState.frameBuffers.Get();
-    if (mState.frameBuffers.Set(wanted)) ++mStatistics.frameBufferSwitches;
+    Take(mState.frameBuffers, mHostFrameBuffers);
+    if (mState.frameBuffers.Set(wanted)) ++mState.statistics.frameBufferSwitches;
 }
 
-void GlTargetSwitch::Settle() {
-    if (mActive) {
-        PrepareForDrawing();
-    } else if (!mDeferred) {
-        GiveBackFrameBuffers();
-    }
-}
-
-void GlTargetSwitch::PrepareForDrawing() {
-    Bind({mActive->GetName(), mActive->GetName()});
-    if (!mHostViewport) mHostViewport = mState.viewport.Get();
-    mState.viewport.Set({0, 0, mActive->GetWidth(), mActive->GetHeight()});
-    if (!mHostObstacles) mHostObstacles = mState.obstacles.Get();
+void GlTargetSwitch::BindTarget(GlTargetUse const& target) {
+    GLuint const name = target.frameBuffer->GetName();
+    Bind({name, name});
+    Take(mState.viewport, mHostViewport);
+    if (target.width > 0) mState.viewport.Set({0, 0, target.width, target.height});
+    Take(mState.obstacles, mHostObstacles);
     mState.obstacles.Set(0);
+}
+
+void GlTargetSwitch::TakeVertexInput() {
+    Take(mState.vertexArray, mHostVertexArray);
+    Take(mState.arrayBuffer, mHostArrayBuffer);
 }
 
 GLuint GlTargetSwitch::GetCurrent() { return mActive ? mActive->GetName() : GetHosts(); }
@@ -49,22 +53,21 @@ GLuint GlTargetSwitch::GetHosts() {
 
 void GlTargetSwitch::GiveBack() {
     GiveBackFrameBuffers();
-    if (mHostViewport) mState.viewport.Set(*mHostViewport);
-    mHostViewport.reset();
-    if (mHostObstacles) mState.obstacles.Set(*mHostObstacles);
-    mHostObstacles.reset();
+    Return(mState.viewport, mHostViewport);
+    Return(mState.obstacles, mHostObstacles);
+    GiveBackVertexInput();
     mState.UnbindSamplers();
-}
-
-void GlTargetSwitch::Detach() {
-    mActive = nullptr;
-    GiveBack();
 }
 
 void GlTargetSwitch::GiveBackFrameBuffers() {
     if (!mHostFrameBuffers) return;
-    if (mState.frameBuffers.Set(*mHostFrameBuffers)) ++mStatistics.frameBufferSwitches;
+    if (mState.frameBuffers.Set(*mHostFrameBuffers)) ++mState.statistics.frameBufferSwitches;
     mHostFrameBuffers.reset();
+}
+
+void GlTargetSwitch::GiveBackVertexInput() {
+    Return(mState.vertexArray, mHostVertexArray);
+    Return(mState.arrayBuffer, mHostArrayBuffer);
 }
 
 } // namespace Moka::detail

@@ -2,6 +2,7 @@
 
 #include "moka/base/log/AndroidLog.h"
 #include "moka/renderer/gles/GlContext.h"
+#include "moka/renderer/gles/GlFrameBuffer.h"
 #include "moka/renderer/gles/GlRenderTarget.h"
 #include "moka/renderer/gles/GlTables.h"
 #include "moka/renderer/gles/GlTextureStorage.h"
@@ -52,7 +53,8 @@ void GlTexture::Bind(int unit) {
         return;
     }
     if (mSampler == 0) mSampler = context.samplers.Get(mSampling);
-    context.state.BindTexture(unit, mStorage->GetName(), mSampler);
+    context.current.SetTexture(unit, mStorage, mSampler);
+    if (context.IsThrough()) context.state.BindTexture(unit, mStorage->GetName(), mSampler);
 }
 
 void GlTexture::Replace(void const* pixels, int stride) {
@@ -70,13 +72,16 @@ void GlTexture::Replace(Rect const& rect, void const* pixels, int stride) {
                             GetLabel(), static_cast<int>(tight), stride);
         return;
     }
+    GetContext().PlayIfUsed(*mStorage);
     mStorage->Upload(rect, pixels, stride > 0 ? stride : tight);
 }
 
 void GlTexture::DrawToCurrent() {
     GlContext& context = GetContext();
     GlOperation const operation(context);
-    if (operation && !IsActiveTarget()) mStorage->CopyTo(context.targets.GetCurrent());
+    if (!operation || IsActiveTarget()) return;
+    context.Play();
+    mStorage->CopyTo(context.targets.GetCurrent());
 }
 
 void GlTexture::SetParameter(int id, int value) {
@@ -100,20 +105,14 @@ void GlTexture::CopyFromRenderTarget() {
     GlContext& context = GetContext();
     GlOperation const operation(context);
     if (!operation || IsActiveTarget()) return;
-    GlRenderTarget const* const active = context.targets.GetActive();
-    int const width = active ? active->GetWidth() : GetWidth();
-    int const height = active ? active->GetHeight() : GetHeight();
-    GLuint const source = context.targets.GetCurrent();
-    bool hasAlpha = true;
-    if (!active || !active->GetStorage()) {
-        // A host may bind another surface under the same name, so the answer cannot be kept. It is cheap
-        // beside the copy.
-        context.targets.BindDraw(source);
-        GLint bits = 0;
-        glGetIntegerv(GL_ALPHA_BITS, &bits);
-        hasAlpha = bits > 0;
+    GlTargetUse target{nullptr, GetWidth(), GetHeight(), 0};
+    if (GlRenderTarget const* const active = context.targets.GetActive()) {
+        target = active->GetUse();
+    } else {
+        target.frameBuffer = GlFrameBuffer::OfHost(context.targets.GetHosts());
     }
-    mStorage->CopyFrom(source, hasAlpha, width, height);
+    context.list.Add(GlTargetCopy{std::move(target), mStorage});
+    context.AfterAdding();
 }
 
 bool GlTexture::IsActiveTarget() const {

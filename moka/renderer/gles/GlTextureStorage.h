@@ -42,6 +42,9 @@ public:
     // To the frame buffer that name stands for, whatever the scissor is.
     void CopyTo(GLuint frameBuffer);
 
+    // The number of the last draw list that named it.
+    std::uint64_t listed = 0;
+
     // A frame buffer with this texture for its colour and nothing else; 0, with one error line, when the
     // driver refuses. The storage keeps one that is given back, because reading a pixel takes and gives one.
     GLuint TakeFrameBuffer();

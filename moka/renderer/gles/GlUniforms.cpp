@@ -46,6 +46,7 @@ GlUniforms::GlUniforms(std::shared_ptr<GlContext> context, GLuint program, char 
     glGetProgramiv(mProgram, GL_ACTIVE_UNIFORMS, &count);
     mUniforms.reserve(static_cast<std::size_t>(count));
     for (GLint i = 0; i < count; ++i) AddUniform(static_cast<GLuint>(i), name);
+    mSent = mValues;
 }
 
 void GlUniforms::AddUniform(GLuint index, char const* programName) {
@@ -54,14 +55,17 @@ void GlUniforms::AddUniform(GLuint index, char const* programName) {
     GLenum glType = GL_NONE;
     glGetActiveUniform(mProgram, index, sizeof name, nullptr, &elements, &glType, name);
     BindingType const type = ToBindingType(glType);
-    if (type == BindingTypeUnknown || elements != 1) {
+    bool const isOneTooMany = type == BindingTypeTextureUnit && GetSamplerCount() == kMaxSamplers;
+    if (type == BindingTypeUnknown || elements != 1 || isOneTooMany) {
         __android_log_print(ANDROID_LOG_ERROR, "mok_log",
                             "%s: the uniform %s cannot be set: GL type 0x%04x, %d elements; single bool, "
-                            "int, float, vec2, vec4, mat4 and sampler2D can",
-                            programName, name, glType, elements);
+                            "int, float, vec2, vec4, mat4 and up to %d sampler2D can",
+                            programName, name, glType, elements, kMaxSamplers);
         return;
     }
-    mUniforms.push_back({name, glGetUniformLocation(mProgram, name), type});
+    if (type == BindingTypeTextureUnit) mSamplers.push_back(static_cast<int>(mUniforms.size()));
+    mUniforms.push_back({name, glGetUniformLocation(mProgram, name), type, mValues.size()});
+    mValues.resize(mValues.size() + detail::GetSize(type));
 }
 
 int GlUniforms::Find(char const* name) const {
@@ -75,68 +79,78 @@ BindingType GlUniforms::GetType(int index) const {
     return index < 0 ? BindingTypeUnknown : mUniforms[static_cast<std::size_t>(index)].type;
 }
 
+int GlUniforms::GetSamplerUnit(int sampler) const {
+    int const index = mSamplers[static_cast<std::size_t>(sampler)];
+    GLint unit = 0;
+    std::memcpy(&unit, &mValues[mUniforms[static_cast<std::size_t>(index)].offset], sizeof unit);
+    return unit;
+}
+
 void GlUniforms::Set(int index, void const* value) {
     if (index < 0 || mProgram == 0) return;
-    Uniform& uniform = mUniforms[static_cast<std::size_t>(index)];
+    Uniform const& uniform = mUniforms[static_cast<std::size_t>(index)];
     // Callers hand over a bool, of which only one byte is there to be read.
     GLint const flag = uniform.type == BindingTypeBool && *static_cast<bool const*>(value) ? 1 : 0;
     void const* const converted = uniform.type == BindingTypeBool ? &flag : value;
-    if (!Store(uniform.value, converted, GetSize(uniform.type))) return;
-    uniform.isSent = false;
+    if (!Store(&mValues[uniform.offset], converted, detail::GetSize(uniform.type))) return;
+    listed.isStale = true;
     GlOperation const operation(*mContext);
-    if (!operation) return;
-    if (mContext->state.program.Get() == mProgram) {
-        Send(uniform);
-    } else {
-        mHasWaiting = true;
-    }
+    // Setting needs the program to be GL's current one; another one's values wait until it is.
+    if (!operation || !mContext->IsThrough() || mContext->state.program.Get() != mProgram) return;
+    Send(uniform, &mValues[uniform.offset]);
 }
 
-void GlUniforms::MakeCurrent() {
+void GlUniforms::MakeCurrent(std::shared_ptr<GlUniforms> const& self) {
     if (!mContext) return;
     GlOperation const operation(*mContext);
     if (!operation) return;
-    mContext->state.program.Set(mProgram);
-    if (mHasWaiting) SendWaiting();
+    mContext->current.SetProgram(self);
+    if (mContext->IsThrough()) PutInForce(GetValues());
 }
 
-void GlUniforms::SendWaiting() {
-    for (Uniform& uniform : mUniforms) {
-        if (!uniform.isSent) Send(uniform);
+void GlUniforms::PutInForce(unsigned char const* values) {
+    mContext->state.SetProgram(mProgram);
+    if (mSent.empty() || std::memcmp(mSent.data(), values, mSent.size()) == 0) return;
+    for (Uniform const& uniform : mUniforms) {
+        std::size_t const size = detail::GetSize(uniform.type);
+        bool const isSent = std::memcmp(&mSent[uniform.offset], values + uniform.offset, size) == 0;
+        if (!isSent) Send(uniform, values + uniform.offset);
     }
-    mHasWaiting = false;
 }
 
-void GlUniforms::Send(Uniform& uniform) {
-    auto const* const floats = reinterpret_cast<GLfloat const*>(uniform.value);
-    GLint const location = uniform.location;
+void GlUniforms::Send(Uniform const& uniform, unsigned char const* value) {
+    std::memcpy(&mSent[uniform.offset], value, detail::GetSize(uniform.type));
+    // Every value starts at a multiple of four bytes.
+    void const* const aligned = &mSent[uniform.offset];
+    auto const* const floats = static_cast<GLfloat const*>(aligned);
     switch (uniform.type) {
     case BindingTypeUnknown:
         break;
     case BindingTypeBool:
     case BindingTypeInt:
     case BindingTypeTextureUnit:
-        glUniform1iv(location, 1, reinterpret_cast<GLint const*>(uniform.value));
+        glUniform1iv(uniform.location, 1, static_cast<GLint const*>(aligned));
         break;
     case BindingTypeFloat:
-        glUniform1fv(location, 1, floats);
+        glUniform1fv(uniform.location, 1, floats);
         break;
     case BindingTypeVector2:
-        glUniform2fv(location, 1, floats);
+        glUniform2fv(uniform.location, 1, floats);
         break;
     case BindingTypeVector4:
-        glUniform4fv(location, 1, floats);
+        glUniform4fv(uniform.location, 1, floats);
         break;
     case BindingTypeMatrix4:
-        glUniformMatrix4fv(location, 1, GL_FALSE, floats);
+        glUniformMatrix4fv(uniform.location, 1, GL_FALSE, floats);
         break;
     }
-    uniform.isSent = true;
+    ++mContext->statistics.uniformChanges;
 }
 
 void GlUniforms::DeleteProgram() {
     if (!mContext) return;
     GlOperation const operation(*mContext);
+    if (operation) mContext->LetGo(*this);
     mContext->Drop(GlNameKind::Program, std::exchange(mProgram, 0));
 }
 

@@ -1,15 +1,16 @@
-// GlUniforms: a linked GL program and the values of its uniforms, shared by the program object and the
-// handles it gave out.
+// GlUniforms: a linked GL program and the values of its uniforms, shared by the program object, the handles
+// it gave out, and the draw list.
 // Owner:   shared; the program object deletes the GL name, and what is left is inert.
 // Thread:  render thread.
-// A value is kept here too: GL sets uniforms of the current program only, and what is set already is not sent
-// again.
+// The values are kept here: a draw takes those down that are set when it is asked for, and what GL has
+// already is not sent again.
 #pragma once
 
 #include "moka/renderer/IParameterBinding.h"
 
 #include <GLES3/gl3.h>
 
+#include <cstdint>
 #include <memory>
 #include <string>
 #include <vector>
@@ -29,29 +30,51 @@ public:
     BindingType GetType(int index) const;
     void Set(int index, void const* value);
 
-    void MakeCurrent();
+    // False for one that draws nothing: it did not compile, or it was deleted.
+    bool CanDraw() const { return mProgram != 0 && !mIsPlaceholder; }
+    // Its sources did not compile, and something that compiles stands in their place.
+    void SetPlaceholder() { mIsPlaceholder = true; }
+    int GetSamplerCount() const { return static_cast<int>(mSamplers.size()); }
+    // The unit that the sampler is set to.
+    int GetSamplerUnit(int sampler) const;
+
+    // All values as GL takes them, GetSize() bytes.
+    unsigned char const* GetValues() const { return mValues.data(); }
+    std::size_t GetSize() const { return mValues.size(); }
+
+    // What the draw list knows of this program.
+    struct Listed {
+        std::uint64_t list = 0;
+        std::size_t offset = 0; // of the values taken down last
+        bool isStale = false;   // something was set since
+    };
+    Listed listed;
+
+    // Within an operation: makes it GL's current program, with these values.
+    void PutInForce(unsigned char const* values);
+
+    void MakeCurrent(std::shared_ptr<GlUniforms> const& self);
     void DeleteProgram();
 
 private:
-    static constexpr int kMaxSize = 64; // bytes; a 4 x 4 matrix
-
     struct Uniform {
         std::string name;
         GLint location;
         BindingType type;
-        bool isSent = true;
-        // As GL takes it. Linking sets every uniform to zero.
-        alignas(GLfloat) unsigned char value[kMaxSize] = {};
+        std::size_t offset; // in the values
     };
 
     void AddUniform(GLuint index, char const* programName);
-    static void Send(Uniform& uniform);
-    void SendWaiting();
+    void Send(Uniform const& uniform, unsigned char const* value);
 
     std::shared_ptr<GlContext> const mContext;
     GLuint mProgram;
+    bool mIsPlaceholder = false;
     std::vector<Uniform> mUniforms;
-    bool mHasWaiting = false; // values that were set while another program was current
+    std::vector<int> mSamplers; // indices of uniforms
+    // Linking sets every uniform to zero.
+    std::vector<unsigned char> mValues;
+    std::vector<unsigned char> mSent;
 };
 
 } // namespace Moka::detail

@@ -6,8 +6,11 @@
 #include "moka/renderer/gles/GlDepthStencil.h"
 #include "moka/renderer/gles/GlDeviceCaps.h"
 #include "moka/renderer/gles/GlFrameBuffer.h"
+#include "moka/renderer/gles/GlGraphicsObject.h"
 #include "moka/renderer/gles/GlProgram.h"
+#include "moka/renderer/gles/GlRasterizer.h"
 #include "moka/renderer/gles/GlRenderTarget.h"
+#include "moka/renderer/gles/GlStateObjects.h"
 #include "moka/renderer/gles/GlTables.h"
 #include "moka/renderer/gles/GlTexture.h"
 #include "moka/renderer/gles/GlTextureStorage.h"
@@ -179,12 +182,53 @@ IShaderProgram* RendererFactory::CreateShaderProgram(char const* vertexSource, c
     return new GlProgram(context, vertexSource, fragmentSource, name);
 }
 
+IGraphicsObject* RendererFactory::CreateGraphicsObject(int streams, PrimitiveType primitive,
+                                                       VertexDescriptor const* descriptor, int indices,
+                                                       int instanceStreams) {
+    std::shared_ptr<GlContext> context = GetAttached("CreateGraphicsObject");
+    if (!context) return nullptr;
+    if (streams != 1 || indices != 0 || instanceStreams != 0 || !descriptor ||
+        descriptor->GetAttributeCount() == 0) {
+        __android_log_print(
+            ANDROID_LOG_ERROR, "mok_log",
+            "RendererFactory::CreateGraphicsObject: %d streams, %d attributes, %d indices, %d "
+            "instance streams are refused; 1 stream with attributes is drawn, the others are 0",
+            streams, descriptor ? descriptor->GetAttributeCount() : 0, indices, instanceStreams);
+        return nullptr;
+    }
+    GlOperation const operation(*context);
+    return new GlGraphicsObject(std::move(context), primitive, *descriptor);
+}
+
+IBlendStateObject* RendererFactory::CreateBlendStateObject(BlendStateDescriptor const& descriptor) {
+    std::shared_ptr<GlContext> context = GetAttached("CreateBlendStateObject");
+    return context ? new GlBlendState(std::move(context), descriptor) : nullptr;
+}
+
+IDepthStencilState* RendererFactory::CreateDepthStencilState(DepthStencilStateDescriptor const& descriptor) {
+    std::shared_ptr<GlContext> context = GetAttached("CreateDepthStencilState");
+    return context ? new GlDepthStencilState(std::move(context), descriptor) : nullptr;
+}
+
+IRasterizerState* RendererFactory::GetRasterizerState() {
+    static GlRasterizer rasterizer;
+    return &rasterizer;
+}
+
+void RendererFactory::SetStencilClip(bool on) {
+    if (GlContext* const context = GlContext::GetAttached()) context->current.SetStencilClip(on);
+}
+
 void RendererFactory::SetDeferred(bool on) {
     if (std::shared_ptr<GlContext> const context = GetContext()) context->SetDeferred(on);
 }
 
 void RendererFactory::Flush() {
     if (std::shared_ptr<GlContext> const context = GetContext()) context->Flush();
+}
+
+void RendererFactory::Commit() {
+    if (std::shared_ptr<GlContext> const context = GetContext()) context->Commit();
 }
 
 void RendererFactory::InvalidateState() {

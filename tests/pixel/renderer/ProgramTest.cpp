@@ -63,7 +63,9 @@ protected:
     // What the current program draws over the whole target.
     Pixel Draw() {
         Clear(*target, kClear);
+        RendererFactory::Commit();
         DrawEverywhere();
+        RendererFactory::InvalidateState();
         Image const image = Read(*target, 2, 2);
         EXPECT_EQ(image, Image(2, 2, image.At(0, 0)));
         return image.At(0, 0);

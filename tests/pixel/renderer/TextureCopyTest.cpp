@@ -60,11 +60,13 @@ TEST_P(TextureCopyTest, ACopyOfTheTargetIgnoresTheStateAndKeepsTheBindings) {
     RendererFactory::InvalidateState();
     target->Activate();
     bound->Bind(0);
+    RendererFactory::Commit();
     glActiveTexture(GL_TEXTURE0);
     GLint const frameBuffer = GetInteger(GL_DRAW_FRAMEBUFFER_BINDING);
     GLint const name = GetInteger(GL_TEXTURE_BINDING_2D);
     RendererFactory::InvalidateState();
     copy->CopyFromRenderTarget();
+    RendererFactory::Commit();
     EXPECT_EQ(GetInteger(GL_DRAW_FRAMEBUFFER_BINDING), frameBuffer);
     EXPECT_EQ(GetInteger(GL_READ_FRAMEBUFFER_BINDING), frameBuffer);
     EXPECT_EQ(GetInteger(GL_TEXTURE_BINDING_2D), name);

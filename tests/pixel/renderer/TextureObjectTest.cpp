@@ -232,18 +232,6 @@ TEST_F(TextureObjectTest, ATextureDeletedElsewhereGoesWhenTheRenderThreadNextRun
     EXPECT_EQ(after.samplers, 0);
 }
 
-TEST_F(TextureObjectTest, ATextureMadeAfterADeletionIsBoundAnewWithItsSampler) {
-    RendererFactory::SetDeferred(true); // so that the shadow is trusted from call to call
-    for (Pixel color : {kRed, kGreen, kBlue}) {
-        // The last one's GL names are free again and may come back here.
-        TexturePtr const texture =
-            MakeTexture(Image(2, 1, color).With(1, 0, Image(1, 1, kClear), 0, 0, 1, 1));
-        texture->SetParameter(TextureParamWrappingS, TextureWrapRepeat);
-        texture->SetParameter(TextureParamFilteringMag, TextureFilterNearest);
-        EXPECT_EQ(Sample(*texture, 1.25f, 0.5f), color);
-    }
-}
-
 TEST_F(TextureObjectTest, BindingLeavesTheActiveUnitToTheHost) {
     TexturePtr const texture = MakeTexture(2, 2);
     glActiveTexture(GL_TEXTURE5);

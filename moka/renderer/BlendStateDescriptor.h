@@ -1,0 +1,63 @@
+// BlendStateDescriptor: how a fragment and the pixel under it become the pixel, as a value.
+// A new one that is enabled replaces: the source counts once and the destination not at all.
+#pragma once
+
+namespace Moka {
+
+enum class BlendingFactor {
+    Zero,
+    One,
+    SrcColor,
+    SrcAlpha,
+    OneMinusSrcAlpha,
+    DstAlpha,
+    OneMinusDstAlpha,
+};
+
+enum class BlendingFunction { Add };
+
+class BlendStateDescriptor {
+public:
+    // source * sourceFactor (function) destination * destinationFactor
+    struct Equation {
+        BlendingFunction function = BlendingFunction::Add;
+        BlendingFactor source = BlendingFactor::One;
+        BlendingFactor destination = BlendingFactor::Zero;
+
+        friend bool operator==(Equation const& a, Equation const& b) {
+            return a.function == b.function && a.source == b.source && a.destination == b.destination;
+        }
+    };
+
+    // Neither blends nor writes colour when enabled is false.
+    explicit BlendStateDescriptor(bool enabled) : mBlending(enabled), mColorWrite(enabled) {}
+
+    void SetEnabled(bool blending, bool colorWrite) {
+        mBlending = blending;
+        mColorWrite = colorWrite;
+    }
+    void SetColorEquation(BlendingFunction function, BlendingFactor source, BlendingFactor destination) {
+        mColor = {function, source, destination};
+    }
+    void SetAlphaEquation(BlendingFunction function, BlendingFactor source, BlendingFactor destination) {
+        mAlpha = {function, source, destination};
+    }
+
+    bool IsBlending() const { return mBlending; }
+    bool IsColorWrite() const { return mColorWrite; }
+    Equation const& GetColorEquation() const { return mColor; }
+    Equation const& GetAlphaEquation() const { return mAlpha; }
+
+    friend bool operator==(BlendStateDescriptor const& a, BlendStateDescriptor const& b) {
+        return a.mBlending == b.mBlending && a.mColorWrite == b.mColorWrite && a.mColor == b.mColor &&
+               a.mAlpha == b.mAlpha;
+    }
+
+private:
+    bool mBlending;
+    bool mColorWrite;
+    Equation mColor;
+    Equation mAlpha;
+};
+
+} // namespace Moka

@@ -1,0 +1,67 @@
+// DepthStencilStateDescriptor: the depth and stencil tests of both faces, as a value.
+// A new one with the stencil on passes always and keeps what is there. The depth test, where it is on, passes
+// what is nearer and writes it.
+#pragma once
+
+namespace Moka {
+
+// The numbers are the interface.
+enum StencilComparison { StencilEqual = 2, StencilNotEqual = 5, StencilAlways = 7 };
+
+enum StencilOperation {
+    StencilKeep = 0,
+    StencilZero = 1,
+    StencilReplace = 2,
+    StencilIncrementSaturate = 3,
+    StencilDecrementSaturate = 4,
+};
+
+class DepthStencilStateDescriptor {
+public:
+    DepthStencilStateDescriptor(bool depth, bool stencil) : mDepth(depth), mStencil(stencil) {}
+
+    // Passes where (reference & readMask) compares to (what is there & readMask); writeMask says which bits
+    // an operation may change.
+    void SetStencilFunction(StencilComparison comparison, int reference, unsigned readMask,
+                            unsigned writeMask) {
+        mComparison = comparison;
+        mReference = reference;
+        mReadMask = readMask;
+        mWriteMask = writeMask;
+    }
+    void SetStencilOperation(StencilOperation stencilFail, StencilOperation depthFail,
+                             StencilOperation pass) {
+        mStencilFail = stencilFail;
+        mDepthFail = depthFail;
+        mPass = pass;
+    }
+
+    bool IsDepth() const { return mDepth; }
+    bool IsStencil() const { return mStencil; }
+    StencilComparison GetComparison() const { return mComparison; }
+    int GetReference() const { return mReference; }
+    unsigned GetReadMask() const { return mReadMask; }
+    unsigned GetWriteMask() const { return mWriteMask; }
+    StencilOperation GetStencilFail() const { return mStencilFail; }
+    StencilOperation GetDepthFail() const { return mDepthFail; }
+    StencilOperation GetPass() const { return mPass; }
+
+    friend bool operator==(DepthStencilStateDescriptor const& a, DepthStencilStateDescriptor const& b) {
+        return a.mDepth == b.mDepth && a.mStencil == b.mStencil && a.mComparison == b.mComparison &&
+               a.mReference == b.mReference && a.mReadMask == b.mReadMask && a.mWriteMask == b.mWriteMask &&
+               a.mStencilFail == b.mStencilFail && a.mDepthFail == b.mDepthFail && a.mPass == b.mPass;
+    }
+
+private:
+    bool mDepth;
+    bool mStencil;
+    StencilComparison mComparison = StencilAlways;
+    int mReference = 0;
+    unsigned mReadMask = 0xFF;
+    unsigned mWriteMask = 0xFF;
+    StencilOperation mStencilFail = StencilKeep;
+    StencilOperation mDepthFail = StencilKeep;
+    StencilOperation mPass = StencilKeep;
+};
+
+} // namespace Moka

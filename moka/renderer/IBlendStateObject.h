@@ -1,0 +1,21 @@
+// IBlendStateObject: a blend state that can be put in force.
+// Owner:  whoever created it, until Release(), which leaves what was applied in force.
+// Thread: render thread.
+#pragma once
+
+#include "moka/renderer/BlendStateDescriptor.h"
+
+namespace Moka {
+
+class IBlendStateObject {
+public:
+    // Takes effect with the next Apply().
+    virtual void SetDescriptor(BlendStateDescriptor const& descriptor) = 0;
+    virtual void Apply() = 0;
+    virtual void Release() = 0;
+
+protected:
+    ~IBlendStateObject() = default;
+};
+
+} // namespace Moka

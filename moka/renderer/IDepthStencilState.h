@@ -1,0 +1,25 @@
+// IDepthStencilState: a depth-stencil state that can be put in force.
+// Owner:  whoever created it, until Release(), which leaves what was applied in force.
+// Thread: render thread.
+#pragma once
+
+#include "moka/renderer/DepthStencilStateDescriptor.h"
+
+namespace Moka {
+
+class IDepthStencilState {
+public:
+    // Takes effect with the next Apply().
+    virtual void SetDescriptor(DepthStencilStateDescriptor const& descriptor) = 0;
+
+    // While a stencil clip is in force (RendererFactory::SetStencilClip), a state without a stencil test
+    // leaves the clip's test as it is.
+    virtual void Apply() = 0;
+
+    virtual void Release() = 0;
+
+protected:
+    ~IDepthStencilState() = default;
+};
+
+} // namespace Moka

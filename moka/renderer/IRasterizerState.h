@@ -1,0 +1,34 @@
+// IRasterizerState: the scissor test: what lies outside the rectangle is neither drawn nor cleared.
+// Owner:  the renderer; there is one.
+// Thread: render thread.
+// Units:  pixels of the target, origin at its first row and column: the bottom left of a host's frame buffer,
+//         the first texel of an off-screen target.
+// What is asked for is answered from memory; GL is asked once when foreign code may have changed it.
+#pragma once
+
+namespace Moka {
+
+struct ScissorRect {
+    int x = 0;
+    int y = 0;
+    int width = 0;
+    int height = 0;
+
+    friend bool operator==(ScissorRect const& a, ScissorRect const& b) {
+        return a.x == b.x && a.y == b.y && a.width == b.width && a.height == b.height;
+    }
+};
+
+class IRasterizerState {
+public:
+    virtual bool IsScissorEnabled() = 0;
+    virtual void SetScissorEnabled(bool on) = 0;
+    virtual ScissorRect GetScissorRect() = 0;
+    // Negative sizes become 0.
+    virtual void SetScissorRect(ScissorRect const& rect) = 0;
+
+protected:
+    ~IRasterizerState() = default;
+};
+
+} // namespace Moka

@@ -1,0 +1,53 @@
+// VertexDescriptor: what one vertex is made of, as a value: attributes in the order in which the vertex stage
+// declares them, tightly packed.
+#pragma once
+
+#include <array>
+#include <cstddef>
+
+namespace Moka {
+
+enum class VertexAttributeType { Float };
+
+class VertexDescriptor {
+public:
+    static constexpr int kMaxAttributes = 8;
+
+    struct Attribute {
+        VertexAttributeType type = VertexAttributeType::Float;
+        int components = 0; // 1 to 4
+
+        friend bool operator==(Attribute const& a, Attribute const& b) {
+            return a.type == b.type && a.components == b.components;
+        }
+    };
+
+    // offset is -1, right behind the attribute before, and stream is 0: vertices have one stream. False, and
+    // nothing is added, for anything else.
+    bool addAttribute(VertexAttributeType type, int components, int offset, int stream) {
+        bool const isKnown = components >= 1 && components <= 4 && offset == -1 && stream == 0;
+        if (!isKnown || mCount == kMaxAttributes) return false;
+        mAttributes[static_cast<std::size_t>(mCount++)] = {type, components};
+        return true;
+    }
+
+    int GetAttributeCount() const { return mCount; }
+    Attribute const& GetAttribute(int index) const { return mAttributes[static_cast<std::size_t>(index)]; }
+
+    // Floats of one vertex.
+    int GetFloatCount() const {
+        int count = 0;
+        for (int i = 0; i < mCount; ++i) count += GetAttribute(i).components;
+        return count;
+    }
+
+    friend bool operator==(VertexDescriptor const& a, VertexDescriptor const& b) {
+        return a.mCount == b.mCount && a.mAttributes == b.mAttributes;
+    }
+
+private:
+    std::array<Attribute, kMaxAttributes> mAttributes;
+    int mCount = 0;
+};
+
+} // namespace Moka

@@ -1,0 +1,72 @@
+#include "moka/renderer/gles/GlVertexFormats.h"
+
+#include "moka/renderer/gles/GlState.h"
+#include "moka/renderer/gles/GlStatistics.h"
+
+#include <cstdint>
+
+namespace Moka::detail {
+
+int GlVertexFormats::Find(VertexDescriptor const& descriptor) {
+    for (std::size_t i = 0; i < mFormats.size(); ++i) {
+        if (mFormats[i].descriptor == descriptor) return static_cast<int>(i);
+    }
+    mFormats.push_back({descriptor, 0});
+    return static_cast<int>(mFormats.size()) - 1;
+}
+
+// A whole new store each time, so that the driver need not wait for the draws that read the old one.
+void GlVertexFormats::Upload(std::vector<GLfloat> const& vertices) {
+    if (mBuffer == 0) {
+        glGenBuffers(1, &mBuffer);
+        ++mState.statistics.buffers;
+    }
+    std::size_t const bytes = vertices.size() * sizeof(GLfloat);
+    mState.arrayBuffer.Set(mBuffer);
+    glBufferData(GL_ARRAY_BUFFER, static_cast<GLsizeiptr>(bytes), vertices.data(), GL_STREAM_DRAW);
+    mState.statistics.vertexBytes += bytes;
+}
+
+void GlVertexFormats::Bind(int format) {
+    Format& wanted = mFormats[static_cast<std::size_t>(format)];
+    if (wanted.vertexArray == 0) {
+        MakeVertexArray(wanted);
+    } else {
+        mState.vertexArray.Set(wanted.vertexArray);
+    }
+}
+
+void GlVertexFormats::MakeVertexArray(Format& format) {
+    glGenVertexArrays(1, &format.vertexArray);
+    ++mState.statistics.buffers;
+    mState.vertexArray.Set(format.vertexArray);
+    mState.arrayBuffer.Set(mBuffer);
+    VertexDescriptor const& descriptor = format.descriptor;
+    auto const stride = static_cast<GLsizei>(descriptor.GetFloatCount() * static_cast<int>(sizeof(GLfloat)));
+    std::uintptr_t offset = 0;
+    for (int i = 0; i < descriptor.GetAttributeCount(); ++i) {
+        int const components = descriptor.GetAttribute(i).components;
+        auto const location = static_cast<GLuint>(i);
+        glEnableVertexAttribArray(location);
+        glVertexAttribPointer(location, components, GL_FLOAT, GL_FALSE, stride,
+                              reinterpret_cast<void const*>(offset));
+        offset += static_cast<std::uintptr_t>(components) * sizeof(GLfloat);
+    }
+}
+
+void GlVertexFormats::Clear() {
+    for (Format& format : mFormats) {
+        if (format.vertexArray == 0) continue;
+        mState.ForgetVertexArray(format.vertexArray);
+        glDeleteVertexArrays(1, &format.vertexArray);
+        --mState.statistics.buffers;
+    }
+    mFormats.clear();
+    if (mBuffer == 0) return;
+    mState.ForgetArrayBuffer(mBuffer);
+    glDeleteBuffers(1, &mBuffer);
+    mBuffer = 0;
+    --mState.statistics.buffers;
+}
+
+} // namespace Moka::detail

@@ -1,0 +1,43 @@
+// GlVertexFormats: one vertex array for each layout of vertices in use, all over one buffer that every play
+// fills anew.
+// Thread: render thread.
+#pragma once
+
+#include "moka/renderer/VertexDescriptor.h"
+
+#include <GLES3/gl3.h>
+
+#include <vector>
+
+namespace Moka::detail {
+
+class GlState;
+
+class GlVertexFormats {
+public:
+    explicit GlVertexFormats(GlState& state) : mState(state) {}
+
+    // The number of the layout, the same for equal ones. Nothing is made in GL yet.
+    int Find(VertexDescriptor const& descriptor);
+
+    // Within an operation: replaces the buffer's contents.
+    void Upload(std::vector<GLfloat> const& vertices);
+    // Within an operation: draws read the buffer in this layout.
+    void Bind(int format);
+
+    void Clear();
+
+private:
+    struct Format {
+        VertexDescriptor descriptor;
+        GLuint vertexArray = 0;
+    };
+
+    void MakeVertexArray(Format& format);
+
+    GlState& mState;
+    std::vector<Format> mFormats;
+    GLuint mBuffer = 0;
+};
+
+} // namespace Moka::detail

@@ -1,0 +1,61 @@
+// What a test asks about records as a whole: the draws, and whether any are kept.
+#include "tests/support/RecordingDraws.h"
+
+#include "tests/support/RecordingObjects.h"
+
+#include <utility>
+
+namespace Moka::Testing {
+
+using namespace detail;
+
+namespace {
+
+using DeviceLock = std::lock_guard<std::recursive_mutex>;
+
+template <class Event>
+std::vector<Event> GetEventsOf() {
+    Device const& device = Device::Get();
+    DeviceLock lock(device.mutex);
+    std::vector<Event> result;
+    for (RecordedEvent const& event : device.events) {
+        if (auto const* const found = std::get_if<Event>(&event)) result.push_back(*found);
+    }
+    return result;
+}
+
+} // namespace
+
+std::vector<RecordedDraw> RecordingRenderer::GetDraws() { return GetEventsOf<RecordedDraw>(); }
+
+std::vector<RecordedClear> RecordingRenderer::GetClears() { return GetEventsOf<RecordedClear>(); }
+
+std::vector<RecordedEvent> RecordingRenderer::GetEvents() {
+    Device const& device = Device::Get();
+    DeviceLock lock(device.mutex);
+    return device.events;
+}
+
+std::vector<RecordedEvent> RecordingRenderer::TakeEvents() {
+    Device& device = Device::Get();
+    DeviceLock lock(device.mutex);
+    return std::exchange(device.events, {});
+}
+
+PipelineState RecordingRenderer::GetState() {
+    Device const& device = Device::Get();
+    DeviceLock lock(device.mutex);
+    return device.state;
+}
+
+void RecordingRenderer::KeepRecords(bool keep) {
+    Device& device = Device::Get();
+    DeviceLock lock(device.mutex);
+    device.keepsRecords = keep;
+    if (keep) return;
+    device.calls = {};
+    device.events = {};
+    device.FreeReleased();
+}
+
+} // namespace Moka::Testing
