@@ -2,15 +2,19 @@
 
 #include "moka/host/EglError.h"
 
+#include "moka/base/log/AndroidLog.h"
+
 #include <EGL/eglext.h>
 
-#include <vector>
+#include <algorithm>
 
 namespace Moka::detail {
 
 std::unique_ptr<EglContext> EglContext::Open(EglRequest const& request, std::string* error) {
     std::string tried;
-    for (EglPlatform const& platform : ListEglPlatforms()) {
+    std::vector<EglPlatform> const platforms =
+        request.window != 0 ? std::vector{GetWindowPlatform(request.windowDisplay)} : ListEglPlatforms();
+    for (EglPlatform const& platform : platforms) {
         std::unique_ptr<EglContext> context(new EglContext(platform));
         if (context->Build(request)) return context;
         tried += (tried.empty() ? "" : "; ") + platform.name + " (" + context->mFailure + ")";
@@ -26,9 +30,9 @@ EglContext::EglContext(EglPlatform const& platform)
 EglContext::~EglContext() {
     if (mContext != EGL_NO_CONTEXT) {
         eglMakeCurrent(mDisplay, EGL_NO_SURFACE, EGL_NO_SURFACE, EGL_NO_CONTEXT);
-        if (mSurface != EGL_NO_SURFACE) eglDestroySurface(mDisplay, mSurface);
         eglDestroyContext(mDisplay, mContext);
     }
+    if (mSurface != EGL_NO_SURFACE) eglDestroySurface(mDisplay, mSurface);
     if (mInitialized) eglTerminate(mDisplay);
     eglReleaseThread();
 }
@@ -40,15 +44,38 @@ bool EglContext::Fail(char const* function) {
 
 bool EglContext::Build(EglRequest const& request) {
     if (mDisplay == EGL_NO_DISPLAY || !Initialize()) return false;
-    bool const wantsSurface = request.surfaceWidth > 1 || request.surfaceHeight > 1;
+    return request.window != 0 ? BuildInWindow(request) : BuildOffscreen(request);
+}
+
+bool EglContext::BuildOffscreen(EglRequest const& request) {
     char const* const extensions = eglQueryString(mDisplay, EGL_EXTENSIONS);
-    mNeedsSurface = wantsSurface || !HasEglExtension(extensions, "EGL_KHR_surfaceless_context");
-    if (!ChooseConfig() || !CreateContext(request.debug)) return false;
-    if (mNeedsSurface && !CreateSurface(request)) return false;
-    mPath += mNeedsSurface ? ", pbuffer " + std::to_string(request.surfaceWidth) + " x " +
-                                 std::to_string(request.surfaceHeight)
-                           : ", no surface";
+    bool const needsSurface = request.surfaceWidth > 1 || request.surfaceHeight > 1 ||
+                              !HasEglExtension(extensions, "EGL_KHR_surfaceless_context");
+    if (!ChooseConfig(needsSurface ? EGL_PBUFFER_BIT : 0)) return false;
+    mConfig = mCandidates.front();
+    if (!CreateContext(request.debug) || (needsSurface && !CreatePbuffer(request))) return false;
+    mPath += needsSurface ? ", pbuffer " + std::to_string(request.surfaceWidth) + " x " +
+                                std::to_string(request.surfaceHeight)
+                          : ", no surface";
+    return MakeCurrent();
+}
+
+// The window decides which configuration fits; only trying tells.
+bool EglContext::BuildInWindow(EglRequest const& request) {
+    if (!ChooseConfig(EGL_WINDOW_BIT) || !CreateWindowSurface(request.window)) return false;
+    mPath += ", window";
+    return CreateContext(request.debug) && MakeCurrent();
+}
+
+bool EglContext::MakeCurrent() {
     return eglMakeCurrent(mDisplay, mSurface, mSurface, mContext) || Fail("eglMakeCurrent");
+}
+
+bool EglContext::SwapBuffers() {
+    if (eglSwapBuffers(mDisplay, mSurface)) return true;
+    __android_log_print(ANDROID_LOG_ERROR, "mok_log", "the window cannot be shown: %s",
+                        DescribeEglFailure("eglSwapBuffers").c_str());
+    return false;
 }
 
 bool EglContext::Initialize() {
@@ -61,38 +88,42 @@ bool EglContext::Initialize() {
     return true;
 }
 
-bool EglContext::ChooseConfig() {
+bool EglContext::ChooseConfig(EGLint surfaceType) {
+    // A window need not be translucent.
+    bool const isWindow = surfaceType == EGL_WINDOW_BIT;
     // clang-format off
     EGLint const wanted[] = {
-        EGL_SURFACE_TYPE, mNeedsSurface ? EGL_PBUFFER_BIT : 0,
+        EGL_SURFACE_TYPE, surfaceType,
         EGL_RENDERABLE_TYPE, EGL_OPENGL_ES3_BIT,
         EGL_RED_SIZE, 8,
         EGL_GREEN_SIZE, 8,
         EGL_BLUE_SIZE, 8,
-        EGL_ALPHA_SIZE, 8,
+        EGL_ALPHA_SIZE, isWindow ? 0 : 8,
         EGL_STENCIL_SIZE, 8,
         EGL_NONE};
     // clang-format on
     EGLint count = 0;
     if (!eglChooseConfig(mDisplay, wanted, nullptr, 0, &count)) return Fail("eglChooseConfig");
-    std::vector<EGLConfig> configs(static_cast<std::size_t>(count));
-    if (!eglChooseConfig(mDisplay, wanted, configs.data(), count, &count)) return Fail("eglChooseConfig");
-    configs.resize(static_cast<std::size_t>(count));
+    mCandidates.resize(static_cast<std::size_t>(count));
+    if (!eglChooseConfig(mDisplay, wanted, mCandidates.data(), count, &count)) return Fail("eglChooseConfig");
+    mCandidates.resize(static_cast<std::size_t>(count));
     // The sizes asked for are the least, and more bits come first.
-    auto const has8Bits = [this](EGLConfig config) {
-        for (EGLint const channel : {EGL_RED_SIZE, EGL_GREEN_SIZE, EGL_BLUE_SIZE, EGL_ALPHA_SIZE}) {
-            EGLint bits = 0;
-            if (!eglGetConfigAttrib(mDisplay, config, channel, &bits) || bits != 8) return false;
+    auto const isUnfit = [this, isWindow](EGLConfig config) {
+        for (EGLint const channel : {EGL_RED_SIZE, EGL_GREEN_SIZE, EGL_BLUE_SIZE}) {
+            if (GetBits(config, channel) != 8) return true;
         }
-        return true;
+        EGLint const alpha = GetBits(config, EGL_ALPHA_SIZE);
+        return alpha != 8 && !(isWindow && alpha == 0);
     };
-    for (EGLConfig const config : configs) {
-        if (!has8Bits(config)) continue;
-        mConfig = config;
-        return true;
-    }
+    mCandidates.erase(std::remove_if(mCandidates.begin(), mCandidates.end(), isUnfit), mCandidates.end());
+    if (!mCandidates.empty()) return true;
     mFailure = "no configuration with OpenGL ES 3, RGBA8888 and an 8-bit stencil";
     return false;
+}
+
+EGLint EglContext::GetBits(EGLConfig config, EGLint channel) const {
+    EGLint bits = 0;
+    return eglGetConfigAttrib(mDisplay, config, channel, &bits) ? bits : -1;
 }
 
 EGLContext EglContext::TryContext(EGLint debugAttribute, EGLint debugValue) {
@@ -112,11 +143,21 @@ bool EglContext::CreateContext(bool debug) {
     return mContext != EGL_NO_CONTEXT || Fail("eglCreateContext");
 }
 
-bool EglContext::CreateSurface(EglRequest const& request) {
+bool EglContext::CreatePbuffer(EglRequest const& request) {
     EGLint const attributes[] = {EGL_WIDTH, request.surfaceWidth, EGL_HEIGHT, request.surfaceHeight,
                                  EGL_NONE};
     mSurface = eglCreatePbufferSurface(mDisplay, mConfig, attributes);
     return mSurface != EGL_NO_SURFACE || Fail("eglCreatePbufferSurface");
+}
+
+bool EglContext::CreateWindowSurface(std::uintptr_t window) {
+    for (EGLConfig const candidate : mCandidates) {
+        mConfig = candidate;
+        // A pointer or a number, as the window system has it: only this cast suits both.
+        mSurface = eglCreateWindowSurface(mDisplay, mConfig, (EGLNativeWindowType)window, nullptr);
+        if (mSurface != EGL_NO_SURFACE) return true;
+    }
+    return Fail("eglCreateWindowSurface");
 }
 
 } // namespace Moka::detail

@@ -7,8 +7,10 @@
 
 #include <EGL/egl.h>
 
+#include <cstdint>
 #include <memory>
 #include <string>
+#include <vector>
 
 namespace Moka::detail {
 
@@ -16,6 +18,9 @@ struct EglRequest {
     bool debug = false;
     int surfaceWidth = 1; // pixels; a side above 1 asks for a default frame buffer of that size
     int surfaceHeight = 1;
+    // A window of the window system's, which is the default frame buffer then; 0 for none.
+    std::uintptr_t window = 0;
+    void* windowDisplay = nullptr;
 };
 
 class EglContext {
@@ -29,25 +34,33 @@ public:
     std::string const& GetPath() const { return mPath; }
     std::string const& GetVersion() const { return mVersion; }
 
+    // Shows what was drawn into the window's frame buffer. False, with one error line, when EGL refuses.
+    bool SwapBuffers();
+
 private:
     explicit EglContext(EglPlatform const& platform);
 
     // Each false with mFailure set.
     bool Build(EglRequest const& request);
     bool Initialize();
-    bool ChooseConfig();
+    bool ChooseConfig(EGLint surfaceType);
     bool CreateContext(bool debug);
-    bool CreateSurface(EglRequest const& request);
+    bool CreatePbuffer(EglRequest const& request);
+    bool CreateWindowSurface(std::uintptr_t window);
+    bool MakeCurrent();
+    bool BuildOffscreen(EglRequest const& request);
+    bool BuildInWindow(EglRequest const& request);
     bool Fail(char const* function);
 
     EGLContext TryContext(EGLint debugAttribute, EGLint debugValue);
+    EGLint GetBits(EGLConfig config, EGLint channel) const;
     bool IsAtLeast15() const { return mMajor > 1 || (mMajor == 1 && mMinor >= 5); }
 
     EGLDisplay mDisplay;
     bool mInitialized = false; // by us, so terminated by us
-    bool mNeedsSurface = true;
     EGLint mMajor = 0;
     EGLint mMinor = 0;
+    std::vector<EGLConfig> mCandidates;
     EGLConfig mConfig = nullptr;
     EGLContext mContext = EGL_NO_CONTEXT;
     EGLSurface mSurface = EGL_NO_SURFACE;

@@ -78,6 +78,11 @@ private:
 
 std::vector<EglPlatform> ListEglPlatforms() { return Finder().List(); }
 
+// EGL's native types are a pointer or a number, as the window system has it: only this cast suits both.
+EglPlatform GetWindowPlatform(void* nativeDisplay) {
+    return Finish("window system", eglGetDisplay((EGLNativeDisplayType)nativeDisplay), "eglGetDisplay");
+}
+
 bool HasEglExtension(char const* extensions, char const* name) {
     std::size_t const length = std::strlen(name);
     for (char const* at = extensions; at && *at;) {

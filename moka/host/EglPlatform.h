@@ -1,4 +1,5 @@
-// EglPlatform: the ways to an EGL display that need no window system, best first.
+// EglPlatform: the ways to an EGL display: of a window system's connection, or those that need none, best
+// first.
 #pragma once
 
 #include <EGL/egl.h>
@@ -16,6 +17,9 @@ struct EglPlatform {
 
 // Only what the EGL at hand offers. Never empty: the default display stands last.
 std::vector<EglPlatform> ListEglPlatforms();
+
+// The display of a window system's connection; null is the default one.
+EglPlatform GetWindowPlatform(void* nativeDisplay);
 
 // Whether a list as eglQueryString gives it, which may be null, has a name.
 bool HasEglExtension(char const* extensions, char const* name);

@@ -3,7 +3,7 @@
 #include "moka/base/Check.h"
 #include "moka/base/RunGuarded.h"
 #include "moka/base/Thread.h"
-#include "moka/graphics/task/ITask.h"
+#include "moka/graphics/task/WorkerTask.h"
 #include "moka/host/EglContext.h"
 #include "moka/renderer/IRendererDeviceCaps.h"
 
@@ -64,25 +64,34 @@ struct RenderThread::Impl {
             return started.set_value("another RenderThread is running in this process; stop it first");
         }
         std::string error;
-        auto const context = detail::EglContext::Open(
-            {options.debugContext, options.surfaceWidth, options.surfaceHeight}, &error);
+        context = detail::EglContext::Open({options.debugContext, options.surfaceWidth, options.surfaceHeight,
+                                            options.nativeWindow, options.nativeDisplay},
+                                           &error);
         if (!context) return started.set_value(std::move(error));
         if (!RendererFactory::AttachContext(options.limits, eglGetProcAddress)) {
-            return started.set_value("the renderer refused the context reached through " +
-                                     context->GetPath() + "; its line in the log says why");
+            error = "the renderer refused the context reached through " + context->GetPath() +
+                    "; its line in the log says why";
+            context.reset();
+            return started.set_value(std::move(error));
         }
         // Nothing is shown before the queue runs empty, so the renderer may collect until then.
         RendererFactory::SetDeferred(true);
-        DescribeContext(*context);
+        DescribeContext();
         started.set_value({});
         owner.Run([] { RendererFactory::Flush(); });
         RendererFactory::DetachContext();
+        context.reset();
     }
 
-    void DescribeContext(detail::EglContext const& context) {
+    void Present() {
+        RendererFactory::Flush();
+        context->SwapBuffers();
+    }
+
+    void DescribeContext() {
         IRendererDeviceCaps const* const caps = RendererFactory::GetRendererDeviceCaps();
-        info.path = context.GetPath();
-        info.eglVersion = context.GetVersion();
+        info.path = context->GetPath();
+        info.eglVersion = context->GetVersion();
         info.vendor = caps->GetVendor();
         info.renderer = caps->GetRenderer();
         info.version = caps->GetVersion();
@@ -92,7 +101,8 @@ struct RenderThread::Impl {
     RenderThread& owner;
     RenderThreadOptions const options;
     RenderContextInfo info;
-    std::promise<std::string> started; // an error, or empty
+    std::unique_ptr<detail::EglContext> context; // made and destroyed on the thread
+    std::promise<std::string> started;           // an error, or empty
     Thread thread;
 };
 
@@ -123,6 +133,10 @@ void RenderThread::Stop() {
 }
 
 RenderContextInfo const& RenderThread::GetContextInfo() const { return mImpl->info; }
+
+bool RenderThread::Present() {
+    return mImpl->options.nativeWindow != 0 && WorkerTask::PostMember(this, mImpl.get(), &Impl::Present);
+}
 
 bool RenderThread::Call(std::function<void()> const& function) {
     if (IsConsumerThread()) return RunCall(function);

@@ -12,7 +12,7 @@ namespace Moka {
 class MOKA_API MKBitmap : public IMKBitmap, public RefCount {
 public:
     // Which of the host's frame buffers a screen bitmap stands for.
-    enum FramebufferType { DefaultFramebuffer = 0, CurrentFramebuffer = -1 };
+    enum FramebufferType : int { DefaultFramebuffer = 0, CurrentFramebuffer = -1 };
 
     MKBitmap(IGLMsgQueue* queue, int x, int y, int width, int height);
 

@@ -4,8 +4,13 @@
 #include "moka/base/BitmapFactory.h"
 #include "moka/base/log/AndroidLog.h"
 #include "moka/graphics/bitmap/ImageDecoding.h"
+#include "moka/graphics/bitmap/MKScreenBitmap.h"
+#include "moka/graphics/bitmap/MKScreenBitmapRT.h"
 #include "moka/graphics/bitmap/MKSharedTextureBitmap.h"
-#include "moka/graphics/canvas/IMKCanvasBase.h"
+#include "moka/graphics/canvas/MKCanvas.h"
+#include "moka/graphics/canvas/MKCanvasRT.h"
+#include "moka/graphics/canvas/MKPenCanvas.h"
+#include "moka/graphics/canvas/MKPenCanvasRT.h"
 #include "moka/graphics/task/WorkerTask.h"
 
 #include <memory>
@@ -25,11 +30,6 @@ bool IsValid(IGLMsgQueue* queue, int width, int height) {
 void LogInvalidParent(IMKBitmap* parent, char const* tag) {
     __android_log_print(ANDROID_LOG_ERROR, "mok_log", "%s, invalid parent bitmap (%p:\"%s\")", "CreateBitmap",
                         static_cast<void*>(parent), tag);
-}
-
-void LogUnavailable(char const* function, char const* what) {
-    __android_log_print(ANDROID_LOG_ERROR, "mok_log", "%s, %s are not part of this version of the library",
-                        function, what);
 }
 
 } // namespace
@@ -103,9 +103,13 @@ Bitmap* MKGraphicsFactory::CreateScaledCPUBitmap(String const* path, int width, 
     return detail::DecodeFile(path, width, height);
 }
 
-IMKBitmap* MKGraphicsFactory::CreateScreenBitmap(IGLMsgQueue*, int, int, int, int, int, int) {
-    LogUnavailable("CreateScreenBitmap", "screen bitmaps");
-    return nullptr;
+IMKBitmap* MKGraphicsFactory::CreateScreenBitmap(IGLMsgQueue* queue, int x, int y, int width, int height,
+                                                 int useDefaultFramebuffer, int useQueue) {
+    auto const type =
+        useDefaultFramebuffer != 0 ? MKBitmap::DefaultFramebuffer : MKBitmap::CurrentFramebuffer;
+    if (useQueue == 0) return new (std::nothrow) MKScreenBitmapRT(queue, x, y, width, height, type);
+    if (!queue) return nullptr;
+    return new (std::nothrow) MKScreenBitmap(queue, x, y, width, height, type);
 }
 
 void MKGraphicsFactory::RefBitmap(IMKBitmap* bitmap) {
@@ -116,14 +120,16 @@ void MKGraphicsFactory::ReleaseBitmap(IMKBitmap* bitmap) {
     if (bitmap) bitmap->Unref();
 }
 
-IMKCanvas* MKGraphicsFactory::CreateCanvas(IGLMsgQueue* queue, IMKBitmap* target, int) {
-    if (queue && target) LogUnavailable("CreateCanvas", "canvases");
-    return nullptr;
+IMKCanvas* MKGraphicsFactory::CreateCanvas(IGLMsgQueue* queue, IMKBitmap* target, int useQueue) {
+    if (!queue || !target) return nullptr;
+    if (useQueue == 0) return new (std::nothrow) MKCanvasRT(queue, target);
+    return new (std::nothrow) MKCanvas(queue, target);
 }
 
-IMKPenCanvas* MKGraphicsFactory::CreatePenCanvas(IGLMsgQueue* queue, IMKBitmap* target, int) {
-    if (queue && target) LogUnavailable("CreatePenCanvas", "pen canvases");
-    return nullptr;
+IMKPenCanvas* MKGraphicsFactory::CreatePenCanvas(IGLMsgQueue* queue, IMKBitmap* target, int useQueue) {
+    if (!queue || !target) return nullptr;
+    if (useQueue == 0) return new (std::nothrow) MKPenCanvasRT(queue, target);
+    return new (std::nothrow) MKPenCanvas(queue, target);
 }
 
 void MKGraphicsFactory::RefCanvas(IMKCanvasBase* canvas) {

@@ -1,7 +1,6 @@
 // MKGraphicsFactory: the entry point. It makes every bitmap and canvas.
 // Owner:  each result carries one reference for the caller, given back with ReleaseBitmap or ReleaseCanvas; a
-// CPU
-//         bitmap is the caller's to delete.
+//         CPU bitmap is the caller's to delete.
 // Thread: any; no state. useQueue chooses the flavour: not 0 makes caller-side objects, usable from any
 //         thread, whose work is posted to queue; 0 makes render-thread objects, to be made and used there
 //         only.
@@ -54,7 +53,8 @@ public:
     static Bitmap* CreateScaledCPUBitmap(String const* path, int width, int height);
 
     // Over the host's default frame buffer, or with useDefaultFramebuffer 0 over the one bound when it is
-    // made.
+    // made. Nothing is validated, but a caller-side one needs a queue: null without. Clips that need the
+    // stencil do not work on it.
     static IMKBitmap* CreateScreenBitmap(IGLMsgQueue* queue, int x, int y, int width, int height,
                                          int useDefaultFramebuffer, int useQueue);
 
@@ -62,7 +62,8 @@ public:
     static void RefBitmap(IMKBitmap* bitmap);
     static void ReleaseBitmap(IMKBitmap* bitmap);
 
-    // Null, without a message, when queue or target is null.
+    // Null, without a message, when queue or target is null. A pen canvas needs a texture bitmap; on another
+    // one it is made, with one error line, and draws nothing.
     static IMKCanvas* CreateCanvas(IGLMsgQueue* queue, IMKBitmap* target, int useQueue);
     static IMKPenCanvas* CreatePenCanvas(IGLMsgQueue* queue, IMKBitmap* target, int useQueue);
 

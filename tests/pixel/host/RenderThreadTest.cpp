@@ -153,14 +153,16 @@ TEST(RenderThreadTest, HandsTheFrameBufferBackWhenTheQueueRunsEmpty) {
     auto const countSwitches = [] { return RendererFactory::GetStatistics().frameBufferSwitches; };
     std::uint64_t before = 0;
     thread->Call([&] {
-        offscreen->Activate();
-        offscreen->Deactivate(false, false);
+        RendererFactory::Flush();
         before = countSwitches();
+        offscreen->ClearColor(1, 0, 0, 1);
+        EXPECT_EQ(countSwitches(), before);
     });
-    for (int i = 0; i < 2000 && countSwitches() == before; ++i) {
+    // There and back.
+    for (int i = 0; i < 2000 && countSwitches() < before + 2; ++i) {
         std::this_thread::sleep_for(std::chrono::milliseconds(5));
     }
-    EXPECT_EQ(countSwitches(), before + 1);
+    EXPECT_EQ(countSwitches(), before + 2);
     thread->Call([&] {
         offscreen->Release();
         delete texture;

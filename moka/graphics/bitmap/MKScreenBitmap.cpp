@@ -1,0 +1,75 @@
+#include "moka/graphics/bitmap/MKScreenBitmap.h"
+
+#include "moka/graphics/task/WorkerTask.h"
+#include "moka/renderer/IRenderTarget.h"
+
+namespace Moka {
+
+template <class F, class... Values>
+void MKScreenBitmap::PostSelf(F function, Values&&... values) {
+    Ref();
+    WorkerTask::PostMember(mMsgQueue, this, function, std::forward<Values>(values)...);
+}
+
+MKScreenBitmap::MKScreenBitmap(IGLMsgQueue* queue, int x, int y, int width, int height, FramebufferType type)
+    : MKScreenBitmapBase(queue, x, y, width, height, type) {
+    PostSelf(&MKScreenBitmap::createRenderTargetRT, width, height, type, true);
+}
+
+MKScreenBitmap::~MKScreenBitmap() {
+    if (IRenderTarget* const target = GetRenderTarget())
+        WorkerTask::PostMember(mMsgQueue, target, &IRenderTarget::Release);
+}
+
+void MKScreenBitmap::createRenderTargetRT(int width, int height, FramebufferType type, bool release) {
+    CreateRenderTarget(width, height, type, "createRenderTargetRT");
+    if (release) Unref();
+}
+
+void MKScreenBitmap::ActivateFrameBuffer() { PostSelf(&MKScreenBitmap::ActivateFrameBufferRT, true); }
+
+unsigned int MKScreenBitmap::GetPixel(Point const& p) {
+    unsigned int pixel = 0;
+    PostSelf(&MKScreenBitmap::getPixelRT, pixel, p); // writes into the task's copy
+    mMsgQueue->WaitForTasks();
+    return pixel;
+}
+
+void MKScreenBitmap::getPixelRT(unsigned int& result, Point const& p) {
+    result = ReadPixel(p);
+    Unref();
+}
+
+void MKScreenBitmap::GetPixelAsync(Point const& p, void* userData, PixelCallback callback) {
+    PostSelf(&MKScreenBitmap::getPixelAsyncRT, p, userData, callback);
+}
+
+void MKScreenBitmap::getPixelAsyncRT(Point const& p, void* userData, PixelCallback callback) {
+    unsigned int const pixel = ReadPixel(p);
+    if (callback) callback(pixel, userData);
+    Unref();
+}
+
+void MKScreenBitmap::GetBitmapData(Rect const& r, void* destination) {
+    PostSelf(&MKScreenBitmap::getBitmapDataRT, r, destination);
+    mMsgQueue->WaitForTasks();
+}
+
+void MKScreenBitmap::getBitmapDataRT(Rect const& r, void* destination) {
+    ReadBlock(r, destination);
+    Unref();
+}
+
+void MKScreenBitmap::GetBitmapDataAsync(Rect const& r, void* destination, void* userData,
+                                        DataCallback callback) {
+    PostSelf(&MKScreenBitmap::getBitmapDataAsyncRT, r, destination, userData, callback);
+}
+
+void MKScreenBitmap::getBitmapDataAsyncRT(Rect const& r, void* destination, void* userData,
+                                          DataCallback callback) {
+    ReadBlock(r, destination);
+    if (callback) callback(r, destination, userData);
+    Unref();
+}
+
+} // namespace Moka

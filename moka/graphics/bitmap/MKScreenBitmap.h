@@ -1,0 +1,42 @@
+// MKScreenBitmap: a screen bitmap for use from any thread: each operation is posted to the render thread. See
+// MKScreenBitmapBase for what it can do.
+// Owner:  each posted operation holds one reference; refused, it is dropped and its reference stays, by
+//         design.
+// Thread: any, except that the blocking reads wait for the render thread and so must not be called on it.
+#pragma once
+
+#include "moka/graphics/bitmap/MKScreenBitmapBase.h"
+
+#include <utility>
+
+namespace Moka {
+
+class MOKA_API MKScreenBitmap final : public MKScreenBitmapBase {
+public:
+    MKScreenBitmap(IGLMsgQueue* queue, int x, int y, int width, int height, FramebufferType type);
+    ~MKScreenBitmap() override;
+
+    void ActivateFrameBuffer() override;
+    // Does nothing, unlike ActivateFrameBuffer; relied upon.
+    void DeactivateFrameBuffer(DiscardFramebufferType) override {}
+
+    // Always 0, after it has read the pixel: relied upon. GetPixelAsync delivers it.
+    unsigned int GetPixel(Point const& p) override;
+    void GetPixelAsync(Point const& p, void* userData, PixelCallback callback) override;
+    void GetBitmapData(Rect const& r, void* destination) override;
+    void GetBitmapDataAsync(Rect const& r, void* destination, void* userData, DataCallback callback) override;
+
+private:
+    // Run by tasks; each drops the task's reference at its end.
+    void createRenderTargetRT(int width, int height, FramebufferType type, bool release);
+    void getPixelRT(unsigned int& result, Point const& p);
+    void getPixelAsyncRT(Point const& p, void* userData, PixelCallback callback);
+    void getBitmapDataRT(Rect const& r, void* destination);
+    void getBitmapDataAsyncRT(Rect const& r, void* destination, void* userData, DataCallback callback);
+
+    // Takes the task's reference and posts.
+    template <class F, class... Values>
+    void PostSelf(F function, Values&&... values);
+};
+
+} // namespace Moka

@@ -1,0 +1,26 @@
+// MKScreenBitmapRT: a screen bitmap for code that already runs on the render thread: everything happens at
+// once, nothing is posted. See MKScreenBitmapBase for what it can do.
+// Thread: render thread only, its destruction included. Callbacks run before the call returns.
+#pragma once
+
+#include "moka/graphics/bitmap/MKScreenBitmapBase.h"
+
+namespace Moka {
+
+class MOKA_API MKScreenBitmapRT final : public MKScreenBitmapBase {
+public:
+    MKScreenBitmapRT(IGLMsgQueue* queue, int x, int y, int width, int height, FramebufferType type);
+    ~MKScreenBitmapRT() override;
+
+    void ActivateFrameBuffer() override { ActivateFrameBufferRT(false); }
+    void DeactivateFrameBuffer(DiscardFramebufferType discard) override {
+        DeactivateFrameBufferRT(false, discard);
+    }
+
+    unsigned int GetPixel(Point const& p) override { return ReadPixel(p); }
+    void GetPixelAsync(Point const& p, void* userData, PixelCallback callback) override;
+    void GetBitmapData(Rect const& r, void* destination) override { ReadBlock(r, destination); }
+    void GetBitmapDataAsync(Rect const& r, void* destination, void* userData, DataCallback callback) override;
+};
+
+} // namespace Moka

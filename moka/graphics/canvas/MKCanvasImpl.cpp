@@ -1,0 +1,216 @@
+#include "moka/graphics/canvas/MKCanvasImpl.h"
+
+#include "moka/base/RefPtr.h"
+#include "moka/base/log/AndroidLog.h"
+#include "moka/graphics/canvas/SourcePiece.h"
+#include "moka/graphics/canvas/VectorOnHeap.h"
+#include "moka/graphics/drawable/IMKCustomDrawable.h"
+
+#include <algorithm>
+#include <new>
+
+namespace Moka {
+namespace {
+
+using Projection = Matrix4<float>;
+
+// The drawable, made when there is none yet. Before anything is activated: its constructor may throw.
+template <class T, class... Arguments>
+T* FindOrMake(std::unique_ptr<T>& drawable, Arguments... arguments) {
+    if (!drawable) drawable.reset(new (std::nothrow) T(arguments...));
+    return drawable.get();
+}
+
+bool HasNoExtent(RectF const& r) { return r.left == r.right || r.top == r.bottom; }
+
+bool DrawsNoLine(PointF const& a, PointF const& b, MKPaint const& paint) {
+    return a == b || paint.GetLineWidth() < 1.0f;
+}
+
+RectF BoxOf(PointF const& a, PointF const& b) {
+    RectF box(a.x, a.y, a.x, a.y);
+    box.MakeRect(b.x, b.y);
+    return box;
+}
+
+RectF BoxOf(std::vector<PointF> const& points) {
+    RectF box(points[0].x, points[0].y, points[0].x, points[0].y);
+    for (PointF const& p : points) box.MakeRect(p.x, p.y);
+    return box;
+}
+
+bool Touches(RectF const& frame, RectF const& shape, Matrix3<float> const& m) {
+    RectF box;
+    m.mapRect(&box, shape);
+    return frame.IsIntersect(box);
+}
+
+bool IsOneFrameBuffer(IMKBitmap* target) {
+    IMKTextureBitmap* const tiled = target->GetTextureBitmap();
+    return !tiled || tiled->GetSubBitmapCount() == 1;
+}
+
+void LogLineDrawableCreated() {
+    // A fixed text, which log filters look for.
+    __android_log_print(ANDROID_LOG_INFO, "mok_log", "%s MKLineDrawable Created",
+                        "void Moka::MKCanvasImpl::DrawSimpleLinesRT(vector<Moka::PointF> *, Moka::Matrix3f, "
+                        "Moka::MKPaint)");
+}
+
+} // namespace
+
+MKCanvasImpl::MKCanvasImpl(IGLMsgQueue* queue, IMKBitmap* bitmap, bool onRenderThread)
+    : MKCanvasImplBase(queue, bitmap, onRenderThread), mQueue(queue) {}
+
+MKCanvasImpl::~MKCanvasImpl() = default;
+
+template <class DrawCall>
+void MKCanvasImpl::DrawInto(IMKBitmapWritable* writable, int index, Matrix3<float> const& m,
+                            DrawCall const& draw) {
+    Drawing const ready(GetClipping(), writable, index);
+    draw(writable->GetProjectionMatrix() * FromMatrix3(m));
+}
+
+template <class DrawCall>
+void MKCanvasImpl::ForEachTouched(RectF const& shape, Matrix3<float> const& m, DrawCall const& draw) {
+    ForEachFrameBuffer([&](FrameBuffer const& frame) {
+        RectF const bounds(frame.bounds);
+        if (!Touches(bounds, shape, m)) return;
+        DrawInto(frame.writable, frame.index, m,
+                 [&](Projection const& projection) { draw(projection, bounds); });
+    });
+}
+
+void MKCanvasImpl::DrawRT(IMKCustomDrawable* drawable, Matrix3<float> const& m, MKPaint const& paint) {
+    auto const held = RefPtr<IMKCustomDrawable>::Adopt(drawable);
+    if (!held) return;
+    ForEachFrameBuffer([&](FrameBuffer const& frame) {
+        DrawInto(frame.writable, -1, m, [&](Projection const& projection) {
+            drawable->DrawRT(projection, MKPaint(paint)); // what foreign code gets is its own
+        });
+    });
+}
+
+void MKCanvasImpl::DrawLineRT(PointF const& a, PointF const& b, Matrix3<float> const& m,
+                              MKPaint const& paint) {
+    if (DrawsNoLine(a, b, paint)) return;
+    MKLineDrawable* const drawable = FindOrMake(mLineDrawable);
+    if (!drawable) return;
+    ForEachTouched(BoxOf(a, b), m, [&](Projection const& projection, RectF const&) {
+        drawable->DrawLineRT(a, b, projection, paint);
+    });
+}
+
+void MKCanvasImpl::DrawSimpleLineRT(PointF const& a, PointF const& b, Matrix3<float> const& m,
+                                    MKPaint const& paint) {
+    if (DrawsNoLine(a, b, paint)) return;
+    MKLineDrawable* const drawable = FindOrMake(mLineDrawable);
+    if (!drawable) return;
+    ForEachTouched(BoxOf(a, b), m, [&](Projection const& projection, RectF const&) {
+        drawable->DrawSimpleLineRT(a, b, projection, paint);
+    });
+}
+
+void MKCanvasImpl::DrawSimpleLinesRT(std::vector<PointF>* points, Matrix3<float> const& m,
+                                     MKPaint const& paint) {
+    std::unique_ptr<std::vector<PointF>> own(points);
+    if (!own || own->empty() || paint.GetLineWidth() < 1.0f) return;
+    bool const isFirst = !mLineDrawable;
+    MKLineDrawable* const drawable = FindOrMake(mLineDrawable);
+    if (!drawable) return;
+    if (isFirst) LogLineDrawableCreated();
+    // The drawable deletes what it is given at every call, so each of several strips gets a copy.
+    bool const once = IsOneFrameBuffer(GetBitmap());
+    ForEachTouched(BoxOf(*own), m, [&](Projection const& projection, RectF const&) {
+        std::vector<PointF>* const given = once ? own.release() : detail::CopyVector(*own).release();
+        if (given) drawable->DrawSimpleLinesRT(given, projection, paint);
+    });
+}
+
+void MKCanvasImpl::DrawRectRT(RectF const& r, Matrix3<float> const& m, MKPaint const& paint) {
+    if (HasNoExtent(r)) return;
+    MKRectDrawable* const drawable = FindOrMake(mRectDrawable);
+    if (!drawable) return;
+    ForEachTouched(r, m, [&](Projection const& projection, RectF const&) {
+        drawable->DrawRectRT(r, projection, paint);
+    });
+}
+
+void MKCanvasImpl::DrawRoundRectRT(RectF const& r, float rx, float ry, Matrix3<float> const& m,
+                                   MKPaint const& paint) {
+    if (HasNoExtent(r)) return;
+    MKRoundRectDrawable* const drawable = FindOrMake(mRoundRectDrawable);
+    if (!drawable) return;
+    ForEachTouched(r, m, [&](Projection const& projection, RectF const&) {
+        drawable->DrawRoundRectRT(r, rx, ry, projection, paint);
+    });
+}
+
+void MKCanvasImpl::DrawCircleRT(PointF const& c, float radius, Matrix3<float> const& m,
+                                MKPaint const& paint) {
+    if (!(radius > 0)) return;
+    MKCircleDrawable* const drawable = FindOrMake(mCircleDrawable);
+    if (!drawable) return;
+    RectF box = BoxOf(c, c);
+    box.IncreaseRect(radius, radius);
+    ForEachTouched(box, m, [&](Projection const& projection, RectF const&) {
+        drawable->DrawCircleRT(c, radius, projection, paint);
+    });
+}
+
+void MKCanvasImpl::DrawBitmapRT(IMKBitmap* src, RectF const& srcRect, RectF const& dstRect,
+                                Matrix3<float> const& m, MKPaint const& paint) {
+    auto const held = RefPtr<IMKBitmap>::Adopt(src);
+    if (!held || HasNoExtent(dstRect)) return;
+    if (!FindOrMake(mBitmapDrawable, mQueue) || !src->GetTextureBitmap()) return;
+    if (paint.GetTileModeX() == MKPaint::Default && paint.GetTileModeY() == MKPaint::Default)
+        DrawInPieces(src, srcRect, dstRect, m, paint);
+    else
+        DrawWhole(src, srcRect, dstRect, m, paint);
+}
+
+void MKCanvasImpl::DrawWhole(IMKBitmap* src, RectF const& srcRect, RectF const& dstRect,
+                             Matrix3<float> const& m, MKPaint const& paint) {
+    RectF const srcBounds(src->GetBitmapRect());
+    ForEachTouched(dstRect, m, [&](Projection const& projection, RectF const& bounds) {
+        mBitmapDrawable->DrawBitmapRT(src->GetBitmapReadable(), srcBounds, bounds, srcRect, dstRect,
+                                      projection, paint);
+    });
+}
+
+void MKCanvasImpl::DrawInPieces(IMKBitmap* src, RectF const& srcRect, RectF const& dstRect,
+                                Matrix3<float> const& m, MKPaint const& paint) {
+    MKPaint clamped(paint);
+    clamped.SetTileMode(MKPaint::Clamp);
+    IMKTextureBitmap* const tiled = src->GetTextureBitmap();
+    for (int i = 0; i < tiled->GetSubBitmapCount(); ++i) {
+        IMKSubBitmap* const strip = tiled->GetSubBitmap(i);
+        detail::SourcePiece piece;
+        if (!strip || !detail::CutToStrip(strip->GetBitmapRect(), srcRect, dstRect, piece)) continue;
+        RectF const stripBounds(strip->GetBitmapRect());
+        ForEachTouched(piece.dst, m, [&](Projection const& projection, RectF const& bounds) {
+            mBitmapDrawable->DrawBitmapRT(strip, stripBounds, bounds, piece.src, piece.dst, projection,
+                                          clamped);
+        });
+    }
+}
+
+void MKCanvasImpl::DrawBitmapsRT(IMKBitmap* src, RectF const& srcRect, std::vector<RectF>* dstRects,
+                                 Matrix3<float> const& m, MKPaint const& paint) {
+    auto const held = RefPtr<IMKBitmap>::Adopt(src);
+    std::unique_ptr<std::vector<RectF>> const dsts(dstRects);
+    IMKBitmapWritable* const writable = GetBitmap()->GetBitmapWritable();
+    if (!held || !dsts || !writable || !FindOrMake(mBitmapDrawable, mQueue)) return;
+    RectF const srcBounds(src->GetBitmapRect());
+    if (!srcRect.IsIntersect(srcBounds)) return;
+    RectF const bounds(GetBitmap()->GetBitmapRect());
+    auto const hidden = [&](RectF const& dst) { return !Touches(bounds, dst, m); };
+    dsts->erase(std::remove_if(dsts->begin(), dsts->end(), hidden), dsts->end());
+    if (dsts->empty()) return;
+    DrawInto(writable, -1, m, [&](Projection const& projection) {
+        mBitmapDrawable->DrawBitmapsRT(src->GetBitmapReadable(), srcBounds, bounds, srcRect, dsts.get(),
+                                       projection, paint);
+    });
+}
+
+} // namespace Moka

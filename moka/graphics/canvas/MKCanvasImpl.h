@@ -1,0 +1,75 @@
+// MKCanvasImpl: the render side of a canvas. It turns each request into calls of a drawable, one for every
+// frame buffer of the target that the shape can touch, under the clip.
+// It keeps neither matrix nor paint: each request brings its own.
+// Thread: render thread; the constructor, without onRenderThread, on any.
+// Units:  pixels before the matrix, which the GPU applies: positions reach it as they are.
+// Cost:   a drawable is made at the first request that needs it. Which frame buffers a shape touches is told
+//         from its corners alone, without the width of a stroke or a fringe; relied upon.
+// Fails:  silently; a drawable whose making failed is tried again by the next request. What a shader's
+//         constructor throws passes through, after everything that the request held has been given back.
+#pragma once
+
+#include "moka/base/Point.h"
+#include "moka/base/Rect.h"
+#include "moka/graphics/canvas/MKCanvasImplBase.h"
+#include "moka/graphics/canvas/MKPaint.h"
+#include "moka/graphics/drawable/MKBitmapDrawable.h"
+#include "moka/graphics/drawable/MKCircleDrawable.h"
+#include "moka/graphics/drawable/MKLineDrawable.h"
+#include "moka/graphics/drawable/MKRectDrawable.h"
+#include "moka/graphics/drawable/MKRoundRectDrawable.h"
+
+#include <memory>
+#include <vector>
+
+namespace Moka {
+
+class IMKCustomDrawable;
+
+class MKCanvasImpl final : public MKCanvasImplBase {
+public:
+    MKCanvasImpl(IGLMsgQueue* queue, IMKBitmap* bitmap, bool onRenderThread);
+    ~MKCanvasImpl() override;
+
+    // Drops one reference on the drawable. Every frame buffer is drawn, each as index -1: so a clip that
+    // needs the stencil does not work on texture bitmaps here. Relied upon.
+    void DrawRT(IMKCustomDrawable* drawable, Matrix3<float> const& m, MKPaint const& paint);
+
+    void DrawLineRT(PointF const& a, PointF const& b, Matrix3<float> const& m, MKPaint const& paint);
+    void DrawSimpleLineRT(PointF const& a, PointF const& b, Matrix3<float> const& m, MKPaint const& paint);
+    // Takes the vector over.
+    void DrawSimpleLinesRT(std::vector<PointF>* points, Matrix3<float> const& m, MKPaint const& paint);
+    void DrawRectRT(RectF const& r, Matrix3<float> const& m, MKPaint const& paint);
+    void DrawRoundRectRT(RectF const& r, float rx, float ry, Matrix3<float> const& m, MKPaint const& paint);
+    void DrawCircleRT(PointF const& c, float radius, Matrix3<float> const& m, MKPaint const& paint);
+
+    // These two drop one reference on src. Of a paint that does not tile, each strip of src is drawn apart,
+    // clamped at its edges.
+    void DrawBitmapRT(IMKBitmap* src, RectF const& srcRect, RectF const& dstRect, Matrix3<float> const& m,
+                      MKPaint const& paint);
+    // Takes the vector over. Reaches the first strips only, as index -1. Relied upon.
+    void DrawBitmapsRT(IMKBitmap* src, RectF const& srcRect, std::vector<RectF>* dstRects,
+                       Matrix3<float> const& m, MKPaint const& paint);
+
+private:
+    // draw(projection, bounds) for each frame buffer that the shape can touch. The one walk of all shapes.
+    template <class DrawCall>
+    void ForEachTouched(RectF const& shape, Matrix3<float> const& m, DrawCall const& draw);
+    // draw(projection) with the frame buffer ready.
+    template <class DrawCall>
+    void DrawInto(IMKBitmapWritable* writable, int index, Matrix3<float> const& m, DrawCall const& draw);
+
+    void DrawWhole(IMKBitmap* src, RectF const& srcRect, RectF const& dstRect, Matrix3<float> const& m,
+                   MKPaint const& paint);
+    void DrawInPieces(IMKBitmap* src, RectF const& srcRect, RectF const& dstRect, Matrix3<float> const& m,
+                      MKPaint const& paint);
+
+    IGLMsgQueue* const mQueue; // not owned
+    std::unique_ptr<MKLineDrawable> mLineDrawable;
+    std::unique_ptr<MKRectDrawable> mRectDrawable;
+    std::unique_ptr<MKRoundRectDrawable> mRoundRectDrawable;
+    std::unique_ptr<MKCircleDrawable> mCircleDrawable;
+    std::unique_ptr<MKBitmapDrawable> mBitmapDrawable;
+};
+
+} // namespace Moka

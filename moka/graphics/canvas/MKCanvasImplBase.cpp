@@ -1,0 +1,83 @@
+#include "moka/graphics/canvas/MKCanvasImplBase.h"
+
+#include "moka/graphics/bitmap/IMKBitmapCanvasAttachable.h"
+#include "moka/graphics/task/WorkerTask.h"
+#include "moka/renderer/RendererFactory.h"
+
+#include <new>
+
+namespace Moka {
+
+MKCanvasImplBase::Target::Target(IMKBitmap* target, bool onRenderThread) : bitmap(target) {
+    bitmap->Ref();
+    IMKBitmapCanvasAttachable* const attachable = bitmap->GetBitmapCanvasAttachable();
+    if (attachable && onRenderThread)
+        attachable->AttachToCanvasRT(false);
+    else if (attachable)
+        attachable->AttachToCanvas();
+}
+
+MKCanvasImplBase::Target::~Target() {
+    if (IMKBitmapCanvasAttachable* const attachable = bitmap->GetBitmapCanvasAttachable())
+        attachable->DetachFromCanvasRT(false);
+    bitmap->Unref();
+}
+
+MKCanvasImplBase::Drawing::Drawing(MKCanvasClipping* clipping, IMKBitmapWritable* writable, int index)
+    : mClipping(clipping), mWritable(writable) {
+    if (mClipping) mClipping->EnableClipRT(index);
+    mWritable->ActivateFrameBufferRT(false);
+}
+
+MKCanvasImplBase::Drawing::~Drawing() {
+    if (mClipping) mClipping->DisableClipRT();
+    mWritable->DeactivateFrameBufferRT(false, DiscardFramebufferNone);
+}
+
+MKCanvasImplBase::MKCanvasImplBase(IGLMsgQueue* queue, IMKBitmap* bitmap, bool onRenderThread)
+    : mTarget(bitmap, onRenderThread) {
+    if (onRenderThread)
+        createClippingRT();
+    else
+        WorkerTask::PostMember(queue, this, &MKCanvasImplBase::createClippingRT);
+}
+
+MKCanvasImplBase::~MKCanvasImplBase() = default;
+
+void MKCanvasImplBase::createClippingRT() {
+    mClipping.reset(new (std::nothrow) MKCanvasClipping(GetBitmap()));
+}
+
+void MKCanvasImplBase::ClearRT(Vector4<float> const& rgba) {
+    bool const clipped = mClipping && mClipping->HasClips();
+    ForEachFrameBuffer([&](FrameBuffer const& frame) {
+        if (mClipping) mClipping->EnableClipRT(frame.index);
+        frame.writable->ClearColorRT(rgba.x, rgba.y, rgba.z, rgba.w);
+        if (mClipping) mClipping->DisableClipRT();
+        // Clearing activates nothing, but the clip has.
+        if (clipped) frame.writable->DeactivateFrameBufferRT(false, DiscardFramebufferNone);
+    });
+}
+
+void MKCanvasImplBase::ClearAllRT(Vector4<float> const& rgba) {
+    IRasterizerState* const rasterizer = RendererFactory::GetRasterizerState();
+    bool const scissored = rasterizer->IsScissorEnabled();
+    ScissorRect const saved = scissored ? rasterizer->GetScissorRect() : ScissorRect{};
+    rasterizer->SetScissorEnabled(false);
+    ForEachFrameBuffer(
+        [&](FrameBuffer const& frame) { frame.writable->ClearColorRT(rgba.x, rgba.y, rgba.z, rgba.w); });
+    if (!scissored) return;
+    // The rectangle comes back, the test does not; the rest of the frame relies on it.
+    rasterizer->SetScissorEnabled(false);
+    rasterizer->SetScissorRect(saved);
+}
+
+void MKCanvasImplBase::AddClipRectRT(ClipInfo const& info) {
+    if (mClipping) mClipping->AddClipRectRT(info);
+}
+
+void MKCanvasImplBase::RemoveClipRectRT(int count) {
+    if (mClipping) mClipping->RemoveClipRectRT(count);
+}
+
+} // namespace Moka

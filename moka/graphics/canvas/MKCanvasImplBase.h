@@ -1,0 +1,90 @@
+// MKCanvasImplBase: what the render sides of canvas and pen canvas share: the target, its clip, and clearing.
+// Owner:  a front end, which has it deleted on the render thread. Holds two references on the target, its own
+//         and that of the attachment.
+// Thread: render thread; the constructor, without onRenderThread, on any.
+// Fails:  silently. Without a clip, for which memory ran out or its task was refused, everything is drawn.
+#pragma once
+
+#include "moka/base/NonAssignable.h"
+#include "moka/graphics/bitmap/IMKBitmap.h"
+#include "moka/graphics/bitmap/IMKSubBitmap.h"
+#include "moka/graphics/bitmap/IMKTextureBitmap.h"
+#include "moka/graphics/canvas/ClipInfo.h"
+#include "moka/graphics/canvas/MKCanvasClipping.h"
+#include "moka/graphics/math/Vector.h"
+
+#include <memory>
+
+namespace Moka {
+
+class MKCanvasImplBase : NonAssignable {
+public:
+    virtual ~MKCanvasImplBase();
+
+    IMKBitmap* GetBitmap() const { return mTarget.bitmap; }
+
+    void createClippingRT();
+    // Within the clip.
+    void ClearRT(Vector4<float> const& rgba);
+    // Everything, whatever clip and scissor say; the scissor rectangle is as before, its test off.
+    void ClearAllRT(Vector4<float> const& rgba);
+    void AddClipRectRT(ClipInfo const& info);
+    void RemoveClipRectRT(int count);
+
+protected:
+    // One of the frame buffers that the target consists of.
+    struct FrameBuffer {
+        IMKBitmapWritable* writable;
+        Rect bounds;
+        int index; // the strip, or -1 for a target that is one frame buffer
+    };
+
+    // A frame buffer ready to be drawn into under the clip, for the scope.
+    class Drawing {
+    public:
+        Drawing(MKCanvasClipping* clipping, IMKBitmapWritable* writable, int index);
+        ~Drawing();
+        Drawing(Drawing const&) = delete;
+        Drawing& operator=(Drawing const&) = delete;
+
+    private:
+        MKCanvasClipping* mClipping;
+        IMKBitmapWritable* mWritable;
+    };
+
+    MKCanvasImplBase(IGLMsgQueue* queue, IMKBitmap* bitmap, bool onRenderThread);
+
+    MKCanvasClipping* GetClipping() const { return mClipping.get(); }
+
+    template <class Action>
+    void ForEachFrameBuffer(Action const& action) const;
+
+private:
+    struct Target {
+        Target(IMKBitmap* target, bool onRenderThread);
+        ~Target();
+        Target(Target const&) = delete;
+        Target& operator=(Target const&) = delete;
+
+        IMKBitmap* const bitmap;
+    };
+
+    Target mTarget;
+    std::unique_ptr<MKCanvasClipping> mClipping;
+};
+
+template <class Action>
+void MKCanvasImplBase::ForEachFrameBuffer(Action const& action) const {
+    IMKBitmap* const bitmap = GetBitmap();
+    IMKTextureBitmap* const tiled = bitmap->GetTextureBitmap();
+    if (!tiled) {
+        if (IMKBitmapWritable* const writable = bitmap->GetBitmapWritable())
+            action(FrameBuffer{writable, bitmap->GetBitmapRect(), -1});
+        return;
+    }
+    for (int i = 0; i < tiled->GetSubBitmapCount(); ++i)
+        if (IMKSubBitmap* const strip = tiled->GetSubBitmap(i))
+            action(FrameBuffer{strip, strip->GetBitmapRect(), i});
+}
+
+} // namespace Moka

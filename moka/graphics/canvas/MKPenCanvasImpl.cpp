@@ -1,0 +1,27 @@
+#include "moka/graphics/canvas/MKPenCanvasImpl.h"
+
+#include "moka/renderer/RendererFactory.h"
+
+namespace Moka {
+
+MKPenCanvasImpl::MKPenCanvasImpl(IGLMsgQueue* queue, IMKBitmap* bitmap, bool onRenderThread)
+    : MKCanvasImplBase(queue, bitmap, onRenderThread) {}
+
+MKPenCanvasImpl::~MKPenCanvasImpl() = default;
+
+Matrix4<float> MKPenCanvasImpl::GetCanvasMatrix() const {
+    IMKBitmapWritable* const writable = GetBitmap()->GetBitmapWritable();
+    return writable ? writable->GetProjectionMatrix() : Matrix4<float>();
+}
+
+void MKPenCanvasImpl::EnableClipRT(int) {
+    if (MKCanvasClipping* const clipping = GetClipping()) clipping->EnableClipRT(-1);
+    RendererFactory::Commit(); // what is drawn next is not drawn through the renderer
+}
+
+void MKPenCanvasImpl::DisableClipRT() {
+    if (MKCanvasClipping* const clipping = GetClipping()) clipping->DisableClipRT();
+    RendererFactory::InvalidateState();
+}
+
+} // namespace Moka

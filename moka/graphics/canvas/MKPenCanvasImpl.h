@@ -1,0 +1,23 @@
+// MKPenCanvasImpl: the render side of a pen canvas: the clip around foreign drawing, without drawables.
+// Thread: render thread; the constructor, without onRenderThread, and GetCanvasMatrix on any.
+#pragma once
+
+#include "moka/graphics/canvas/MKCanvasImplBase.h"
+#include "moka/graphics/math/Matrix4.h"
+
+namespace Moka {
+
+class MKPenCanvasImpl final : public MKCanvasImplBase {
+public:
+    MKPenCanvasImpl(IGLMsgQueue* queue, IMKBitmap* bitmap, bool onRenderThread);
+    ~MKPenCanvasImpl() override;
+
+    // From the target's pixels to clip space.
+    Matrix4<float> GetCanvasMatrix() const;
+
+    // A pen canvas draws into the bitmap as one frame buffer, whatever the index. Relied upon.
+    void EnableClipRT(int frameBuffer);
+    void DisableClipRT();
+};
+
+} // namespace Moka

@@ -1,0 +1,16 @@
+// SourcePiece.h: what one strip contributes when a bitmap is drawn.
+#pragma once
+
+#include "moka/base/Rect.h"
+
+namespace Moka::detail {
+
+struct SourcePiece {
+    RectF src;
+    RectF dst; // what of dst shows src
+};
+
+// The part of src that lies on the strip; false when none does.
+bool CutToStrip(Rect const& strip, RectF const& src, RectF const& dst, SourcePiece& piece);
+
+} // namespace Moka::detail

@@ -1,0 +1,56 @@
+// StencilClip: draws clip rectangles into the stencil of a frame buffer, so that what is allowed holds 1.
+// Thread: render thread.
+// Fails:  what the renderer refused at construction leaves the stencil cleared and the clip unmade; the
+//         constructor lets pass what the shader's throws.
+#pragma once
+
+#include "moka/graphics/canvas/ScissorClip.h"
+#include "moka/graphics/drawable/RendererPtr.h"
+#include "moka/graphics/drawable/ShaderPtr.h"
+#include "moka/graphics/math/Matrix4.h"
+#include "moka/renderer/IBlendStateObject.h"
+#include "moka/renderer/IDepthStencilState.h"
+#include "moka/renderer/IGraphicsObject.h"
+
+namespace Moka {
+
+class IMKBitmapWritable;
+class MKRectShader;
+
+namespace detail {
+
+class StencilClip {
+public:
+    StencilClip();
+    ~StencilClip();
+    StencilClip(StencilClip const&) = delete;
+    StencilClip& operator=(StencilClip const&) = delete;
+
+    // The frame buffer is active, without a scissor. Afterwards the stencil test lets through what the clips
+    // allow, the stencil does not change any more, and colours are written again.
+    void Draw(ClipList const& clips, IMKBitmapWritable& frameBuffer);
+
+private:
+    // What is drawn: the clip rectangle under its matrix, or everything.
+    struct Area {
+        IGraphicsObject* graphics;
+        Matrix4<float> matrix;
+    };
+
+    bool IsReady() const;
+    void DrawClips(ClipList const& clips, IMKBitmapWritable& frameBuffer);
+    void DrawClip(ClipInfo const& clip, IMKBitmapWritable& frameBuffer);
+    void FillClipGeometry(ClipInfo const& clip);
+    // Draws with a reference of its own into the stencil alone.
+    void Pass(Area const& area, StencilComparison comparison, int reference, StencilOperation operation);
+    void AllowWhereOne();
+
+    RendererPtr<IGraphicsObject> mClipGeometry;
+    RendererPtr<IGraphicsObject> mScreenGeometry;
+    RendererPtr<IDepthStencilState> mDepthStencil;
+    RendererPtr<IBlendStateObject> mBlend;
+    ShaderPtr<MKRectShader> mShader;
+};
+
+} // namespace detail
+} // namespace Moka

@@ -1,0 +1,28 @@
+// VectorOnHeap.h: vectors whose ownership travels with a request.
+#pragma once
+
+#include <memory>
+#include <new>
+#include <vector>
+
+namespace Moka::detail {
+
+// One element for each of source, converted. Null, not an exception, when memory runs out.
+template <class T, class Source, class Convert>
+std::unique_ptr<std::vector<T>> NewVector(Source const& source, Convert const& convert) noexcept try {
+    auto result = std::make_unique<std::vector<T>>();
+    result->reserve(source.size());
+    for (auto const& element : source) result->push_back(convert(element));
+    return result;
+} catch (std::bad_alloc const&) {
+    return nullptr;
+}
+
+template <class T>
+std::unique_ptr<std::vector<T>> CopyVector(std::vector<T> const& source) noexcept try {
+    return std::make_unique<std::vector<T>>(source);
+} catch (std::bad_alloc const&) {
+    return nullptr;
+}
+
+} // namespace Moka::detail

@@ -1,0 +1,61 @@
+// CustomDrawable: what the custom drawables share: the life of the GPU objects, which are made and released
+// on the render thread while the drawable itself is made and dropped anywhere, and the bitmaps drawn.
+// Owner:  reference counted; the creator holds the first reference, the task that makes the GPU objects one
+//         more. A queue that refuses that task leaves a drawable that draws nothing and lives for good, by
+//         design; one that refuses a release leaks that object.
+// Thread: construction, destruction and setters on the caller's thread, DrawRT on the render thread. Setters
+//         take no lock and reach the next DrawRT, also one that was asked for before.
+// Fails:  silently: without GPU objects, or without a bitmap that can be sampled, DrawRT touches nothing.
+#pragma once
+
+#include "moka/base/RefCount.h"
+#include "moka/base/RefPtr.h"
+#include "moka/graphics/bitmap/IMKBitmap.h"
+#include "moka/graphics/drawable/IMKCustomDrawable.h"
+#include "moka/renderer/IGraphicsObject.h"
+#include "moka/renderer/VertexDescriptor.h"
+
+#include <memory>
+
+namespace Moka::detail {
+
+// Not exported: what a caller may reach, through the classes below this one, is inline or virtual.
+template <class Shader>
+class CustomDrawable : public IMKCustomDrawable, private RefCount {
+public:
+    ~CustomDrawable() override;
+    int Ref() override { return RefCount::Ref(); }
+    int Unref() override { return RefCount::Unref(); }
+
+protected:
+    CustomDrawable(IGLMsgQueue* queue, PrimitiveType primitive, VertexDescriptor const& vertex);
+
+    // Does nothing when it is the bitmap already held; otherwise takes a reference of its own. Null is none.
+    static void Hold(RefPtr<IMKBitmap>& held, IMKBitmap* bitmap) {
+        if (held.Get() != bitmap) held = RefPtr<IMKBitmap>::Share(bitmap);
+    }
+    // Null when there is none that can be sampled.
+    static IMKBitmapReadable* GetReadable(RefPtr<IMKBitmap> const& bitmap);
+
+    bool IsConstructed() const;
+
+    // Everything that comes before the uniforms. The caller sets all of them, the projection first, then ends
+    // with DrawVertices.
+    Shader& Begin(void const* vertices, int count, IMKBitmapReadable* tiled, MKPaint const& paint);
+    void DrawVertices();
+
+    RefPtr<IMKBitmap> mBitmap;
+    RefPtr<IMKBitmap> mSecondBitmap; // of those that have two
+
+private:
+    struct Objects;
+
+    void ConstructRT();
+
+    IGLMsgQueue* mQueue;
+    PrimitiveType mPrimitive;
+    VertexDescriptor mVertex;
+    std::unique_ptr<Objects> mObjects; // of the render thread
+};
+
+} // namespace Moka::detail

@@ -1,0 +1,34 @@
+// DrawState: the blend and the depth-stencil state that a drawable draws with, both its own.
+// Thread: render thread, except PostRelease.
+// Fails:  a state that the renderer refused makes it false; whoever draws asks first.
+#pragma once
+
+#include "moka/graphics/canvas/MKPaint.h"
+#include "moka/graphics/drawable/RendererPtr.h"
+#include "moka/renderer/IBlendStateObject.h"
+#include "moka/renderer/IDepthStencilState.h"
+
+namespace Moka::detail {
+
+class DrawState {
+public:
+    // Blending, and neither a depth nor a stencil test.
+    DrawState();
+
+    explicit operator bool() const { return mBlend && mDepthStencil; }
+
+    // Both ask for a state that is true.
+    void ApplyBlend(MKPaint::XFermode mode);
+    void ApplyDepthStencil() { mDepthStencil->Apply(); }
+
+    // The blend state first. Afterwards it is false.
+    void Release();
+    // The same from any thread.
+    void PostRelease(IGLMsgQueue* queue);
+
+private:
+    RendererPtr<IBlendStateObject> mBlend;
+    RendererPtr<IDepthStencilState> mDepthStencil;
+};
+
+} // namespace Moka::detail

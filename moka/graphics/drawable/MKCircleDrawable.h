@@ -1,0 +1,37 @@
+// MKCircleDrawable: draws circles, always anti-aliased: one quad, whose program measures the distance to the
+// centre, drawn once for the fill and once for the stroke.
+// Thread: render thread.
+// Units:  those of the projection's source.
+// Fails:  what the renderer refused at construction makes the draws do nothing; the constructor lets pass
+//         what the shader's throws.
+#pragma once
+
+#include "moka/base/NonAssignable.h"
+#include "moka/base/Point.h"
+#include "moka/graphics/canvas/MKPaint.h"
+#include "moka/graphics/drawable/DrawState.h"
+#include "moka/graphics/drawable/RendererPtr.h"
+#include "moka/graphics/drawable/ShaderPtr.h"
+#include "moka/graphics/math/Matrix4.h"
+#include "moka/renderer/IGraphicsObject.h"
+
+namespace Moka {
+
+class MKCircleShader;
+
+class MKCircleDrawable : NonAssignable {
+public:
+    MKCircleDrawable();
+    virtual ~MKCircleDrawable();
+
+    // Strokes of any positive width are drawn, unlike those of other shapes, which need 1. Relied upon.
+    void DrawCircleRT(PointF const& center, float radius, Matrix4<float> const& projection,
+                      MKPaint const& paint);
+
+private:
+    detail::RendererPtr<IGraphicsObject> mGraphics;
+    detail::DrawState mState;
+    detail::ShaderPtr<MKCircleShader> mShader;
+};
+
+} // namespace Moka

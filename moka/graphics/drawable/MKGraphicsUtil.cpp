@@ -1,0 +1,77 @@
+#include "moka/graphics/drawable/MKGraphicsUtil.h"
+
+#include "moka/graphics/bitmap/IMKBitmapReadable.h"
+
+#include <iterator>
+
+namespace Moka {
+namespace {
+
+using F = BlendingFactor;
+
+struct Factors {
+    F source;
+    F destination;
+    F sourceAlpha;
+    F destinationAlpha;
+};
+
+constexpr Factors kSrcOver = {F::One, F::OneMinusSrcAlpha, F::One, F::OneMinusSrcAlpha};
+
+// By transfer mode, up to the last one that blends.
+constexpr Factors kFactors[] = {
+    {F::One, F::One, F::One, F::One},                             // Add
+    {F::Zero, F::Zero, F::Zero, F::Zero},                         // Clear
+    {F::Zero, F::One, F::Zero, F::One},                           // Dst
+    {F::OneMinusDstAlpha, F::SrcAlpha, F::One, F::Zero},          // DstAtop
+    {F::Zero, F::SrcAlpha, F::Zero, F::SrcAlpha},                 // DstIn
+    {F::Zero, F::OneMinusSrcAlpha, F::Zero, F::OneMinusSrcAlpha}, // DstOut
+    // DstOver: the alpha pair is not the colour pair; relied upon.
+    {F::OneMinusDstAlpha, F::One, F::OneMinusSrcAlpha, F::One},
+    {F::Zero, F::SrcColor, F::Zero, F::SrcAlpha},                    // Modulate
+    {F::One, F::Zero, F::One, F::Zero},                              // Src
+    {F::DstAlpha, F::OneMinusSrcAlpha, F::Zero, F::One},             // SrcAtop
+    {F::DstAlpha, F::Zero, F::DstAlpha, F::Zero},                    // SrcIn
+    {F::OneMinusDstAlpha, F::Zero, F::OneMinusDstAlpha, F::Zero},    // SrcOut
+    kSrcOver,                                                        // SrcOver
+    {F::One, F::Zero, F::Zero, F::One},                              // SrcKeepDstAlpha
+    {F::SrcAlpha, F::Zero, F::One, F::Zero},                         // SrcNonPremultiplied
+    {F::SrcAlpha, F::OneMinusSrcAlpha, F::One, F::OneMinusSrcAlpha}, // SrcOverNonPremultiplied
+    {F::One, F::Zero, F::One, F::Zero},                              // Darken
+    {F::One, F::Zero, F::One, F::Zero},                              // Lighten
+};
+static_assert(std::size(kFactors) == MKPaint::BlendingOff);
+
+void SetWrap(IMKBitmapReadable* bitmap, TextureParamWrapping axis, MKPaint::TileMode mode) {
+    switch (mode) {
+    case MKPaint::Default:
+    case MKPaint::Clamp:
+        return bitmap->SetTextureWrapRT(axis, TextureWrapClampToEdge, false);
+    case MKPaint::Mirror:
+        return bitmap->SetTextureWrapRT(axis, TextureWrapMirroredRepeat, false);
+    case MKPaint::Repeat:
+        return bitmap->SetTextureWrapRT(axis, TextureWrapRepeat, false);
+    }
+}
+
+} // namespace
+
+BlendStateDescriptor MKGraphicsUtil::GetBlendingStateDescriptor(MKPaint::XFermode mode) {
+    BlendStateDescriptor descriptor(true);
+    if (mode == MKPaint::BlendingOff) {
+        descriptor.SetEnabled(false, true);
+        return descriptor;
+    }
+    bool const isKnown = mode >= 0 && mode < MKPaint::BlendingOff;
+    Factors const& factors = isKnown ? kFactors[mode] : kSrcOver;
+    descriptor.SetColorEquation(BlendingFunction::Add, factors.source, factors.destination);
+    descriptor.SetAlphaEquation(BlendingFunction::Add, factors.sourceAlpha, factors.destinationAlpha);
+    return descriptor;
+}
+
+void MKGraphicsUtil::SetTileModeRT(IMKBitmapReadable* bitmap, MKPaint const& paint) {
+    SetWrap(bitmap, TextureParamWrappingS, paint.GetTileModeX());
+    SetWrap(bitmap, TextureParamWrappingT, paint.GetTileModeY());
+}
+
+} // namespace Moka

@@ -1,0 +1,55 @@
+// MKLineDrawable: draws lines. A full line is one quad, whatever its caps and dashes, which its program
+// makes; simple lines have neither, but any number of them is one call of the renderer.
+// Thread: render thread.
+// Units:  those of the projection's source.
+// Fails:  what the renderer refused at construction makes the draws do nothing; the constructor lets pass
+//         what a shader's throws.
+// A line narrower than 1 draws nothing, and one without length nothing that can be seen: it has no direction.
+#pragma once
+
+#include "moka/base/NonAssignable.h"
+#include "moka/base/Point.h"
+#include "moka/graphics/canvas/MKPaint.h"
+#include "moka/graphics/drawable/DrawState.h"
+#include "moka/graphics/drawable/RendererPtr.h"
+#include "moka/graphics/drawable/ShaderPtr.h"
+#include "moka/graphics/math/Matrix4.h"
+#include "moka/renderer/IGraphicsObject.h"
+
+#include <vector>
+
+namespace Moka {
+
+class MKLineShader;
+class MKRectShader;
+
+class MKLineDrawable : NonAssignable {
+public:
+    MKLineDrawable();
+    virtual ~MKLineDrawable();
+
+    // Always anti-aliased.
+    void DrawLineRT(PointF const& start, PointF const& end, Matrix4<float> const& projection,
+                    MKPaint const& paint);
+
+    // Anti-aliased along its sides if the paint says so; the ends are cut square at the points.
+    void DrawSimpleLineRT(PointF const& start, PointF const& end, Matrix4<float> const& projection,
+                          MKPaint const& paint);
+
+    // Points in pairs; an odd last one is ignored. Takes the vector over and deletes it, except when the line
+    // is narrower than 1: then it stays the caller's. Callers rely on it.
+    void DrawSimpleLinesRT(std::vector<PointF>* points, Matrix4<float> const& projection,
+                           MKPaint const& paint);
+
+private:
+    void DrawSimpleVertices(void const* vertices, int count, Matrix4<float> const& projection,
+                            MKPaint const& paint);
+
+    detail::RendererPtr<IGraphicsObject> mLineGraphics;
+    detail::DrawState mState;
+    detail::RendererPtr<IGraphicsObject> mSimpleGraphics;
+    detail::ShaderPtr<MKLineShader> mLineShader;
+    detail::ShaderPtr<MKRectShader> mRectShader;
+};
+
+} // namespace Moka

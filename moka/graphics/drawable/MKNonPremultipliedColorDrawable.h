@@ -1,0 +1,25 @@
+// MKNonPremultipliedColorDrawable: one bitmap over another, at the origin and in the size of the upper one,
+// as colour that is not premultiplied. Nothing is drawn until both are set.
+// See CustomDrawable.h for ownership, threads and failures.
+#pragma once
+
+#include "moka/base/Export.h"
+#include "moka/graphics/drawable/CustomDrawable.h"
+
+namespace Moka {
+
+class MKNonPremultipliedColorShader;
+
+class MOKA_API MKNonPremultipliedColorDrawable final
+    : public detail::CustomDrawable<MKNonPremultipliedColorShader> {
+public:
+    explicit MKNonPremultipliedColorDrawable(IGLMsgQueue* queue);
+    ~MKNonPremultipliedColorDrawable() override;
+
+    // src over dst; takes a reference on each.
+    void SetBitmap(IMKBitmap* src, IMKBitmap* dst);
+
+    void DrawRT(Matrix4<float> const& projection, MKPaint const& paint) override;
+};
+
+} // namespace Moka

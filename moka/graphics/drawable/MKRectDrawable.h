@@ -1,0 +1,38 @@
+// MKRectDrawable: draws rectangles in one colour, filled, stroked or both, in one call of the renderer each.
+// Anti-aliasing is in the triangles: a fringe one unit wide, half of it inside, over which the coverage
+// falls.
+// Thread: render thread.
+// Units:  those of the projection's source. The fringe and the stroke scale with it.
+// Fails:  what the renderer refused at construction makes the draws do nothing and return false; the
+//         constructor lets pass what the shader's throws.
+#pragma once
+
+#include "moka/base/NonAssignable.h"
+#include "moka/base/Rect.h"
+#include "moka/graphics/canvas/MKPaint.h"
+#include "moka/graphics/drawable/DrawState.h"
+#include "moka/graphics/drawable/RendererPtr.h"
+#include "moka/graphics/drawable/ShaderPtr.h"
+#include "moka/graphics/math/Matrix4.h"
+#include "moka/renderer/IGraphicsObject.h"
+
+namespace Moka {
+
+class MKRectShader;
+
+class MKRectDrawable : NonAssignable {
+public:
+    MKRectDrawable();
+    virtual ~MKRectDrawable();
+
+    // A stroke narrower than 1 draws nothing. An inverted rectangle, or a stroke wider than the rectangle,
+    // gives inverted triangles; nothing is clamped.
+    bool DrawRectRT(RectF const& rect, Matrix4<float> const& projection, MKPaint const& paint);
+
+private:
+    detail::RendererPtr<IGraphicsObject> mGraphics;
+    detail::DrawState mState;
+    detail::ShaderPtr<MKRectShader> mShader;
+};
+
+} // namespace Moka

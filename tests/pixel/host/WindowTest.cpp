@@ -1,0 +1,69 @@
+// A render thread over a window of an X server: what is presented is what the server shows.
+#include "moka/graphics/MokaGraphics.h"
+#include "moka/host/RenderThread.h"
+#include "tests/pixel/host/XWindow.h"
+
+#include <gtest/gtest.h>
+
+#include <chrono>
+#include <memory>
+#include <thread>
+
+namespace Moka::Testing {
+namespace {
+
+constexpr int kWidth = 64;
+constexpr int kHeight = 48;
+
+class WindowTest : public ::testing::Test {
+protected:
+    void SetUp() override {
+        window = XWindow::Open(kWidth, kHeight);
+        if (!window) GTEST_SKIP() << "no X server; run under xvfb-run";
+        options.nativeWindow = window->GetWindow();
+        options.nativeDisplay = window->GetDisplay();
+    }
+
+    // The server shows a presented image a moment later.
+    bool ShowsSoon(int x, int y, unsigned long color) const {
+        for (int i = 0; i < 500; ++i) {
+            if (window->GetPixel(x, y) == color) return true;
+            std::this_thread::sleep_for(std::chrono::milliseconds(10));
+        }
+        return false;
+    }
+
+    std::unique_ptr<XWindow> window;
+    RenderThreadOptions options;
+};
+
+TEST_F(WindowTest, WhatIsDrawnOnAScreenBitmapIsShownWhenPresented) {
+    std::string error;
+    std::unique_ptr<RenderThread> const thread = RenderThread::Start(options, &error);
+    ASSERT_TRUE(thread) << error;
+    EXPECT_NE(thread->GetContextInfo().path.find("window"), std::string::npos);
+    IMKBitmap* const screen =
+        MKGraphicsFactory::CreateScreenBitmap(thread.get(), 0, 0, kWidth, kHeight, 1, 1);
+    IMKCanvas* const canvas = MKGraphicsFactory::CreateCanvas(thread.get(), screen, 1);
+    canvas->ClearAll(static_cast<int>(0xFF0000FF));
+    MKPaint paint;
+    paint.SetColor(static_cast<int>(0xFFFF0000));
+    canvas->DrawRect(0, 0, kWidth, kHeight / 2, &paint);
+    EXPECT_TRUE(thread->Present());
+    EXPECT_TRUE(ShowsSoon(5, 5, 0xFF0000)); // the upper half, not the lower one
+    EXPECT_TRUE(ShowsSoon(5, kHeight - 5, 0x0000FF));
+
+    paint.SetColor(static_cast<int>(0xFF00FF00));
+    canvas->DrawRect(0, 0, kWidth, kHeight, &paint);
+    thread->WaitForTasks();
+    EXPECT_EQ(window->GetPixel(5, 5), 0xFF0000u); // drawn, not presented
+    EXPECT_TRUE(thread->Present());
+    EXPECT_TRUE(ShowsSoon(5, 5, 0x00FF00));
+    MKGraphicsFactory::ReleaseCanvas(canvas);
+    MKGraphicsFactory::ReleaseBitmap(screen);
+    thread->Stop();
+    EXPECT_FALSE(thread->Present());
+}
+
+} // namespace
+} // namespace Moka::Testing

@@ -1,0 +1,215 @@
+// Bitmaps: texture coordinates, batches, and the copy of the destination that darken and lighten need.
+#include "moka/graphics/bitmap/IMKBitmapReadable.h"
+#include "moka/graphics/bitmap/IMKSubBitmap.h"
+#include "moka/graphics/bitmap/IMKTextureBitmap.h"
+#include "moka/graphics/bitmap/MKGraphicsFactory.h"
+#include "moka/graphics/drawable/MKBitmapDrawable.h"
+#include "moka/renderer/IDepthStencilState.h"
+#include "moka/renderer/IRenderTarget.h"
+#include "moka/renderer/ITextureObject.h"
+#include "tests/support/Queues.h"
+#include "tests/unit/drawable/DrawableFixture.h"
+
+#include <array>
+#include <optional>
+
+namespace Moka::Testing {
+namespace {
+
+using ::testing::ElementsAre;
+using ::testing::IsEmpty;
+using ::testing::SizeIs;
+
+class BitmapDrawableTest : public DrawableFixture {
+protected:
+    void SetUp() override {
+        DrawableFixture::SetUp();
+        bitmap =
+            RefPtr<IMKBitmap>::Adopt(MKGraphicsFactory::CreateBitmap(&queue, 8, 4, nullptr, false, 0, false));
+        readable = bitmap->GetBitmapReadable();
+        drawable.emplace(&queue);
+        RecordingRenderer::TakeCalls();
+    }
+    void TearDown() override {
+        drawable.reset();
+        bitmap = {};
+        EXPECT_EQ(queue.GetPostedCount(), 0);
+        DrawableFixture::TearDown();
+    }
+
+    bool Draw(RectF const& dst, MKPaint const& paint, RectF const& target = {0, 0, 100, 50}) {
+        return drawable->DrawBitmapRT(readable, RectF(0, 0, 8, 4), target, RectF(2, 1, 6, 3), dst, projection,
+                                      paint);
+    }
+    bool DrawBatch(std::vector<RectF> const& dsts, MKPaint const& paint,
+                   RectF const& target = {0, 0, 100, 50}) {
+        return drawable->DrawBitmapsRT(readable, RectF(0, 0, 8, 4), target, RectF(2, 1, 6, 3), &dsts,
+                                       projection, paint);
+    }
+
+    // What was done to textures other than the bitmap's own, without their parameters.
+    static std::vector<std::string> TakeTextureCalls() {
+        std::vector<std::string> calls;
+        for (std::string const& call : RecordingRenderer::TakeCalls())
+            if (call.rfind("texture", 0) == 0 && call.rfind("texture 1 ", 0) != 0 &&
+                call.find("SetParameter") == std::string::npos)
+                calls.push_back(call);
+        return calls;
+    }
+
+    HandPumpedQueue queue;
+    RefPtr<IMKBitmap> bitmap;
+    IMKBitmapReadable* readable = nullptr;
+    std::optional<MKBitmapDrawable> drawable;
+};
+
+TEST_F(BitmapDrawableTest, TheCornersCarryTheCornersOfTheSource) {
+    EXPECT_TRUE(Draw(RectF(10, 20, 30, 28), MKPaint()));
+    RecordedDraw const draw = TakeDraw();
+    EXPECT_EQ(draw.shader, "MKBitmapShader");
+    EXPECT_EQ(draw.primitive, PrimitiveType::TriangleList);
+    EXPECT_EQ(draw.floatsPerVertex, 5);
+    EXPECT_THAT(VerticesOf(draw),
+                ElementsAre(Vertex{10, 20, 1, 0.25f, 0.25f}, Vertex{10, 28, 1, 0.25f, 0.75f},
+                            Vertex{30, 20, 1, 0.75f, 0.25f}, Vertex{30, 20, 1, 0.75f, 0.25f},
+                            Vertex{10, 28, 1, 0.25f, 0.75f}, Vertex{30, 28, 1, 0.75f, 0.75f}));
+
+    // A bitmap that does not lie at the origin: its left edge is added on the right.
+    RectF const bounds(10, 20, 18, 24);
+    std::vector<RectF> const dsts = {RectF(0, 0, 5, 5)};
+    EXPECT_TRUE(drawable->DrawBitmapRT(readable, bounds, bounds, RectF(12, 21, 16, 23), dsts[0], projection,
+                                       MKPaint()));
+    EXPECT_TRUE(drawable->DrawBitmapsRT(readable, bounds, bounds, RectF(12, 21, 16, 23), &dsts, projection,
+                                        MKPaint()));
+    for (RecordedDraw const& shifted : TakeDraws()) {
+        EXPECT_THAT(VerticesOf(shifted).front(), ElementsAre(0, 0, 1, 0.25f, 0.25f));
+        EXPECT_THAT(VerticesOf(shifted).back(), ElementsAre(5, 5, 1, (16.0f + 10.0f) / 8.0f, 0.75f));
+    }
+}
+
+TEST_F(BitmapDrawableTest, TheFringeDoesNotStretchTheTexture) {
+    MKPaint paint;
+    paint.SetAntiAliasing(true);
+    RectF const dst(3.5f, 4, 12, 10.25f);
+    EXPECT_TRUE(Draw(dst, paint));
+    std::vector<Vertex> const vertices = VerticesOf(TakeDraw());
+    EXPECT_THAT(vertices, SizeIs(30));
+    ExpectCoverage(vertices, 0, 16, [&](double x, double y) {
+        return 0.5 + std::min({x - dst.left, dst.right - x, y - dst.top, dst.bottom - y});
+    });
+    for (Vertex const& v : vertices) {
+        EXPECT_EQ(v[3], v[0] < 7 ? 0.25f : 0.75f);
+        EXPECT_EQ(v[4], v[1] < 7 ? 0.25f : 0.75f);
+    }
+}
+
+TEST_F(BitmapDrawableTest, ABatchIsTheSameVerticesInOneDraw) {
+    std::vector<RectF> const dsts = {RectF(0, 0, 5, 5), RectF(30, 0, 20, 5), RectF(1, 2, 3, 4)};
+    for (bool antiAliased : {false, true}) {
+        MKPaint paint;
+        paint.SetAntiAliasing(antiAliased);
+        std::vector<float> expected;
+        for (RectF const& dst : dsts) {
+            EXPECT_TRUE(Draw(dst, paint));
+            std::vector<float> const one = TakeDraw().vertices;
+            expected.insert(expected.end(), one.begin(), one.end());
+        }
+        EXPECT_TRUE(DrawBatch(dsts, paint));
+        RecordedDraw const batch = TakeDraw();
+        EXPECT_EQ(batch.count, antiAliased ? 90 : 18);
+        EXPECT_EQ(batch.vertices, expected);
+    }
+    // Nothing of the last batch is left over.
+    EXPECT_TRUE(DrawBatch({}, MKPaint()));
+    EXPECT_THAT(TakeDraw().vertices, IsEmpty());
+}
+
+TEST_F(BitmapDrawableTest, TheDrawUsesThePaintAndTheBitmapAndLeavesTheStencilAlone) {
+    MKPaint paint = CommonPaint();
+    ForceStencil();
+    EXPECT_TRUE(Draw(RectF(0, 0, 5, 5), paint));
+    EXPECT_TRUE(DrawBatch({RectF(0, 0, 5, 5)}, paint));
+    std::vector<RecordedDraw> const draws = TakeDraws();
+    EXPECT_THAT(draws, SizeIs(2));
+    for (RecordedDraw const& draw : draws) {
+        ExpectCommonState(draw);
+        EXPECT_TRUE(draw.state.depthStencil.IsStencil());
+        EXPECT_EQ(draw.textures.at(0), "texture 1");
+        EXPECT_EQ(Values(draw, {"uSrcTexture"}), "0");
+    }
+}
+
+TEST_F(BitmapDrawableTest, EachAxisWrapsAsThePaintSaysAndAnUnknownModeLeavesItAlone) {
+    ITextureObject const* const texture = bitmap->GetTextureBitmap()->GetSubBitmap(0)->GetTexture();
+    auto const wrap = [&](int x, int y) {
+        MKPaint paint;
+        paint.SetTileMode(static_cast<MKPaint::TileMode>(x), static_cast<MKPaint::TileMode>(y));
+        Draw(RectF(0, 0, 5, 5), paint);
+        return std::array<int, 2>{RecordingRenderer::GetParameter(texture, 0),
+                                  RecordingRenderer::GetParameter(texture, 1)};
+    };
+    EXPECT_THAT(wrap(2, 3), ElementsAre(3, 0));
+    EXPECT_THAT(wrap(4, 0), ElementsAre(3, 1));
+    EXPECT_THAT(wrap(3, -1), ElementsAre(0, 1));
+    EXPECT_THAT(wrap(1, 2), ElementsAre(1, 3));
+}
+
+TEST_F(BitmapDrawableTest, DarkenAndLightenSampleACopyOfTheDestinationMadeOnceASize) {
+    MKPaint paint = CommonPaint();
+    paint.SetXFermode(MKPaint::Darken);
+    std::string const tag = "MKBitmapDrawable::DrawBitmapRT mDstBitmapForAdvancedBlending";
+    EXPECT_TRUE(Draw(RectF(0, 0, 5, 5), paint));
+    EXPECT_THAT(TakeTextureCalls(), ElementsAre("texture 2 Create 100 50", "texture 2 SetLabel " + tag,
+                                                "texture 2 CopyFromRenderTarget", "texture 2 Bind 1"));
+    RecordedDraw const draw = TakeDraw();
+    EXPECT_EQ(draw.shader, "MKBitmapAdvancedBlendingShader");
+    EXPECT_EQ(draw.textures.at(0), "texture 1");
+    EXPECT_EQ(draw.textures.at(1), "texture 2");
+    EXPECT_EQ(draw.state.blend.GetColorEquation().destination, BlendingFactor::Zero);
+    EXPECT_EQ(Values(draw, {"uSrcTexture", "uDstTexture", "uDstTextureSize", "uBlendingMode", "uColor"}),
+              "0 | 1 | 100 50 | 1 | 0.5 0.25 0.125 0.75");
+
+    // Only the size of the target counts, and both calls share the copy.
+    paint.SetXFermode(MKPaint::Lighten);
+    EXPECT_TRUE(DrawBatch({RectF(0, 0, 5, 5)}, paint, RectF(40, 30, 140, 80)));
+    EXPECT_THAT(TakeTextureCalls(), ElementsAre("texture 2 CopyFromRenderTarget", "texture 2 Bind 1"));
+    EXPECT_EQ(Values(TakeDraw(), {"uBlendingMode"}), "2");
+
+    EXPECT_TRUE(DrawBatch({RectF(0, 0, 5, 5)}, paint, RectF(0, 0, 101, 50)));
+    EXPECT_THAT(TakeTextureCalls(), ElementsAre("texture 2 Release", "texture 3 Create 101 50",
+                                                "texture 3 SetLabel " + tag + " 1",
+                                                "texture 3 CopyFromRenderTarget", "texture 3 Bind 1"));
+}
+
+TEST_F(BitmapDrawableTest, WithoutACopyOfTheDestinationNothingIsDrawn) {
+    MKPaint paint;
+    paint.SetXFermode(MKPaint::Darken);
+    for (float const size : {kNaN, kInfinity, -kInfinity, 3e9f, 0.0f, 0.5f, -5.0f})
+        EXPECT_FALSE(Draw(RectF(0, 0, 5, 5), paint, RectF(0, 0, size, 10))) << size;
+    RecordingRenderer::FailCreations(ObjectKind::Texture);
+    EXPECT_FALSE(Draw(RectF(0, 0, 5, 5), paint));
+    RecordingRenderer::StopFailing();
+    EXPECT_THAT(TakeDraws(), IsEmpty());
+    EXPECT_TRUE(Draw(RectF(0, 0, 5, 5), paint, RectF(0, 0, 20, 10)));
+}
+
+TEST_F(BitmapDrawableTest, BadInputDrawsNothingOrDoesNoHarm) {
+    std::vector<RectF> const dsts = {RectF(0, 0, kNaN, kInfinity)};
+    RectF const r(0, 0, 8, 4);
+    EXPECT_FALSE(drawable->DrawBitmapRT(nullptr, r, r, r, r, projection, MKPaint()));
+    EXPECT_FALSE(drawable->DrawBitmapsRT(nullptr, r, r, r, &dsts, projection, MKPaint()));
+    EXPECT_FALSE(drawable->DrawBitmapsRT(readable, r, r, r, nullptr, projection, MKPaint()));
+    for (ObjectKind kind :
+         {ObjectKind::GraphicsObject, ObjectKind::BlendState, ObjectKind::DepthStencilState}) {
+        RecordingRenderer::FailCreations(kind);
+        MKBitmapDrawable refused(&queue);
+        RecordingRenderer::StopFailing();
+        EXPECT_FALSE(refused.DrawBitmapRT(readable, r, r, r, r, projection, MKPaint()));
+        EXPECT_FALSE(refused.DrawBitmapsRT(readable, r, r, r, &dsts, projection, MKPaint()));
+    }
+    EXPECT_THAT(TakeDraws(), IsEmpty());
+    EXPECT_TRUE(drawable->DrawBitmapsRT(readable, RectF(), r, dsts[0], &dsts, projection, MKPaint()));
+}
+
+} // namespace
+} // namespace Moka::Testing
