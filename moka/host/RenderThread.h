@@ -57,8 +57,8 @@ public:
     // queue refused it or it threw (one error line). On the render thread itself it runs at once.
     bool Call(std::function<void()> const& function);
 
-    // Any thread: shows in the window what was posted before; posted itself, so it returns at once. False when
-    // the queue refused it, or when there is no window.
+    // Any thread: shows in the window what was posted before; posted itself, so it returns at once. False
+    // when the queue refused it, or when there is no window.
     bool Present();
 
 private:

@@ -1,0 +1,54 @@
+// CanvasChecker: what the checkers of plain and of pen canvases have in common; see Checker.
+#pragma once
+
+#include "moka/graphics/canvas/IMKCanvasBase.h"
+#include "moka/graphics/debug/Checker.h"
+
+namespace Moka::detail {
+
+// Ends the process in the way of a call to a pure virtual function.
+[[noreturn]] MOKA_API void EndAsPureVirtual();
+
+template <class Interface>
+class MOKA_API CanvasChecker : public Checker<Interface> {
+public:
+    using ClipOp = IMKCanvasBase::ClipOp;
+    using SaveFlag = IMKCanvasBase::SaveFlag;
+
+    void Clear(int argb) override { Checked().Clear(argb); }
+    void Clear(float r, float g, float b, float a) override { Checked().Clear(r, g, b, a); }
+    void ClearAll(int argb) override { Checked().ClearAll(argb); }
+    void ClearAll(float r, float g, float b, float a) override { Checked().ClearAll(r, g, b, a); }
+
+    int Save(SaveFlag flag) override { return Checked().Save(flag); }
+    void Restore(int level) override { Checked().Restore(level); }
+    void SetClipRect(int x, int y, int width, int height, ClipOp op) override {
+        Checked().SetClipRect(x, y, width, height, op);
+    }
+
+    void SetMatrix(Matrix3<float> const& m) override { Checked().SetMatrix(m); }
+    // Pure in a checker, which can be made all the same; relied upon.
+    Matrix3<float> GetMatrix() override { EndAsPureVirtual(); }
+    void PreConcat(Matrix3<float> const& m) override { Checked().PreConcat(m); }
+    void PostConcat(Matrix3<float> const& m) override { Checked().PostConcat(m); }
+    void PreScale(float sx, float sy) override { Checked().PreScale(sx, sy); }
+    void PostScale(float sx, float sy) override { Checked().PostScale(sx, sy); }
+    void PreRotate(float degrees) override { Checked().PreRotate(degrees); }
+    void PreRotate(float degrees, float px, float py) override { Checked().PreRotate(degrees, px, py); }
+    void PostRotate(float degrees) override { Checked().PostRotate(degrees); }
+    void PostRotate(float degrees, float px, float py) override { Checked().PostRotate(degrees, px, py); }
+    void PreTranslate(float tx, float ty) override { Checked().PreTranslate(tx, ty); }
+    void PostTranslate(float tx, float ty) override { Checked().PostTranslate(tx, ty); }
+
+    // What was set through the checker, whatever tag the canvas has itself; relied upon.
+    char const* GetTag() override {
+        this->checkRefCount();
+        return this->GetOwnTag();
+    }
+
+protected:
+    using Checker<Interface>::Checker;
+    using Checker<Interface>::Checked;
+};
+
+} // namespace Moka::detail

@@ -1,0 +1,24 @@
+// MKPenCanvasChecker: a pen canvas that hands every call on to another one while it is referenced, and throws
+// "Canvas was already released!!" afterwards. Owner, Thread, Fails: see Checker.h.
+// GetMatrix ends the process, as a call to a pure virtual function does; relied upon. GetBitmap forwards.
+#pragma once
+
+#include "moka/graphics/canvas/IMKPenCanvas.h"
+#include "moka/graphics/debug/CanvasChecker.h"
+
+namespace Moka {
+
+class MOKA_API MKPenCanvasChecker final : public detail::CanvasChecker<IMKPenCanvas> {
+public:
+    explicit MKPenCanvasChecker(IMKPenCanvas* canvas); // not null, not owned
+    ~MKPenCanvasChecker() override;
+
+    IMKBitmap* GetBitmap() override { return Checked().GetBitmap(); }
+
+    Matrix3<float> GetModelMatrix() override { return Checked().GetModelMatrix(); }
+    Matrix4<float> GetCanvasMatrix() override { return Checked().GetCanvasMatrix(); }
+    void EnableClipRT(int frameBuffer) override { Checked().EnableClipRT(frameBuffer); }
+    void DisableClipRT() override { Checked().DisableClipRT(); }
+};
+
+} // namespace Moka
