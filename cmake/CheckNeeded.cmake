@@ -3,7 +3,7 @@
 # Beyond ALLOWED (file names without version) only the C++ runtime and sanitizer runtimes are accepted.
 cmake_policy(VERSION 3.25)
 
-set(runtime libstdc++ libc++ libc++abi libgcc_s libm libc libpthread ld-linux-x86-64 ld-linux-aarch64
+set(runtime libstdc++ libc++ libc++_shared libc++abi libgcc_s libm libc libpthread libdl ld-linux-x86-64 ld-linux-aarch64
   libasan libubsan libtsan)
 
 execute_process(COMMAND ${READELF} -d ${LIBRARY} OUTPUT_VARIABLE dynamic COMMAND_ERROR_IS_FATAL ANY)

@@ -28,6 +28,8 @@
 #include "moka/graphics/drawable/MKGaussianBlurDrawable.h"
 #include "moka/graphics/drawable/MKNonPremultipliedColorDrawable.h"
 #include "moka/graphics/drawable/MKTextMaskBitmapDrawable.h"
+#include "moka/graphics/jni/Display.h"
+#include "moka/graphics/jni/IDisplay.h"
 #include "moka/graphics/loader/BitmapLoader.h"
 #include "moka/graphics/loader/BitmapLoaderInterface.h"
 #include "moka/graphics/loader/MKBitmapLoader.h"

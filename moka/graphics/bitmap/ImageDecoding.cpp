@@ -10,6 +10,7 @@ namespace Moka {
 namespace {
 
 std::atomic<bool> useNativeDecoder{false};
+std::atomic<detail::JavaDecoder> javaDecoder{nullptr};
 
 Bitmap* DecodeNatively(String const* path, int width, int height) {
     if (width != 0 && height != 0) return BitmapFactory::CreateBitmap(path, width, height);
@@ -34,9 +35,12 @@ void MKBitmapFactory_UseNativeDecoder() { useNativeDecoder = true; }
 
 Bitmap* CreateBitmapJNI(String const* path, int width, int height) {
     if (useNativeDecoder) return DecodeNatively(path, width, height);
+    if (detail::JavaDecoder const decode = javaDecoder) return decode(path, width, height);
     __android_log_print(ANDROID_LOG_ERROR, "mok_log", "MKBitmapFactory : gDecodeFile Not loaded");
     return nullptr;
 }
+
+void detail::SetJavaDecoder(JavaDecoder decoder) { javaDecoder = decoder; }
 
 Bitmap* detail::DecodeFile(String const* path, int width, int height) {
     if (CompareExtensionByFile(path, "mki")) return DecodeNatively(path, width, height);

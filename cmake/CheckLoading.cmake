@@ -1,0 +1,58 @@
+# CheckLoading: fails when a shared library could not be loaded on a device with 16 KB pages, or when its
+# exported names are not those that it is to have.
+# cmake -DLIBRARY=file -DREADELF=... -DNM=... [-DEXPORTS=list] -P CheckLoading.cmake
+cmake_policy(VERSION 3.25)
+
+set(page 16384)
+
+execute_process(COMMAND ${READELF} -lW ${LIBRARY} OUTPUT_VARIABLE segments COMMAND_ERROR_IS_FATAL ANY)
+string(REGEX MATCHALL "LOAD [^\n]*0x[0-9a-f]+\n" loads "${segments}")
+if(NOT loads)
+  message(FATAL_ERROR "${LIBRARY}: no loaded segments found; is ${READELF} working?")
+endif()
+foreach(load IN LISTS loads)
+  string(REGEX MATCH "0x[0-9a-f]+\n" align "${load}")
+  string(STRIP ${align} align)
+  math(EXPR remainder "${align} % ${page}")
+  if(remainder)
+    message(FATAL_ERROR "${LIBRARY}: a segment is aligned to ${align}, which is no multiple of ${page}.")
+  endif()
+endforeach()
+
+if(NOT EXPORTS)
+  return()
+endif()
+file(STRINGS ${EXPORTS} expected REGEX "^[^#]")
+set(missing ${expected})
+list(FILTER missing EXCLUDE REGEX "::")
+
+# Mangled names: what kind of thing it is, then the namespaces and the name, each behind its length.
+set(kind "_Z(T[VIST]|Th[0-9n]+_|Tv[0-9n]+_[0-9n]+_|GV)?Z?")
+set(errors "")
+execute_process(COMMAND ${NM} -D --defined-only ${LIBRARY} OUTPUT_VARIABLE symbols COMMAND_ERROR_IS_FATAL ANY)
+string(REGEX MATCHALL "[A-Za-z] [^ \n]+\n" symbols "${symbols}")
+foreach(symbol IN LISTS symbols)
+  string(STRIP "${symbol}" symbol)
+  if(symbol MATCHES "^. ${kind}N[KVRO]*4Moka(6detail)?([0-9]+)(.*)$")
+    string(SUBSTRING "${CMAKE_MATCH_4}" 0 ${CMAKE_MATCH_3} name)
+    set(name "${CMAKE_MATCH_2}::${name}")
+    string(REPLACE "6detail" "::detail" name "Moka${name}")
+  elseif(symbol MATCHES "^[VWu] ${kind}N?K?(S[tabsiod]|9__gnu_cxx)")
+    continue() # the standard library's templates, which every library has
+  else()
+    string(SUBSTRING "${symbol}" 2 -1 name)
+    list(REMOVE_ITEM missing ${name})
+  endif()
+  if(NOT name IN_LIST expected)
+    list(APPEND errors "  exported: ${name}")
+  endif()
+endforeach()
+foreach(name IN LISTS missing)
+  list(APPEND errors "  missing: ${name}")
+endforeach()
+if(errors)
+  list(REMOVE_DUPLICATES errors)
+  list(JOIN errors "\n" errors)
+  message(FATAL_ERROR "${LIBRARY} and ${EXPORTS} differ. Hide what nobody is to link to; list the rest.
+${errors}")
+endif()

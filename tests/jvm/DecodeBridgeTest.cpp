@@ -1,0 +1,289 @@
+// Files decoded through Java: a Java factory that does what the test tells it, and Java bitmaps that fail
+// where they are told to.
+#include "moka/base/Bitmap.h"
+#include "moka/base/BitmapFactory.h"
+#include "moka/base/String.h"
+#include "moka/base/log/AndroidLog.h"
+#include "moka/graphics/bitmap/ImageDecoding.h"
+#include "moka/graphics/jni/OnLoad.h"
+#include "tests/jvm/JavaMachine.h"
+#include "tests/jvm/PatchedFunctions.h"
+#include "tests/support/LogCapture.h"
+
+#include <cstring>
+#include <filesystem>
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+#include <memory>
+#include <string>
+#include <thread>
+#include <vector>
+
+namespace Moka::Testing {
+namespace {
+
+using testing::ElementsAre;
+using testing::HasSubstr;
+using BitmapOwner = std::unique_ptr<Bitmap>;
+using Bytes = std::vector<unsigned char>;
+
+constexpr char const* kFactory = "com/velmora/android/sdk/pen/graphics/MokaBitmapFactory";
+constexpr char const* kBitmap = "android/graphics/Bitmap";
+constexpr char const* kBitmapType = "Landroid/graphics/Bitmap;";
+constexpr char const* kStringType = "Ljava/lang/String;";
+constexpr char const* kNotLoaded = "MKBitmapFactory : gDecodeFile Not loaded";
+
+// What a lookup by name is not to find, however the class path looks.
+std::string hidden;
+JNINativeInterface_ const* original;
+
+char const* Hide(char const* name) { return hidden == name ? "isNotThere" : name; }
+jclass JNICALL FindClass(JNIEnv* env, char const* name) { return original->FindClass(env, Hide(name)); }
+jmethodID JNICALL GetStaticMethodID(JNIEnv* env, jclass type, char const* name, char const* signature) {
+    return original->GetStaticMethodID(env, type, Hide(name), signature);
+}
+jmethodID JNICALL GetMethodID(JNIEnv* env, jclass type, char const* name, char const* signature) {
+    return original->GetMethodID(env, type, Hide(name), signature);
+}
+
+// Loads the bridge where one name is missing.
+int LoadWithout(char const* name) {
+    JNIEnv* const env = JavaMachine::GetMainEnv();
+    PatchedFunctions functions(env);
+    hidden = name;
+    original = &functions.GetOriginal();
+    functions->FindClass = &FindClass;
+    functions->GetStaticMethodID = &GetStaticMethodID;
+    functions->GetMethodID = &GetMethodID;
+    int const result = MKBitmapFactory_OnLoad(JavaMachine::GetVm(), env);
+    EXPECT_FALSE(env->ExceptionCheck()) << name;
+    return result;
+}
+
+class DecodeBridge : public testing::Test {
+protected:
+    void SetUp() override {
+        ASSERT_EQ(mEnv->PushLocalFrame(32), JNI_OK);
+        mFactory = mEnv->FindClass(kFactory);
+        SetResult(nullptr);
+        SetThrowing(false);
+        JavaMachine::TakeOutput();
+    }
+    void TearDown() override {
+        EXPECT_FALSE(mEnv->ExceptionCheck());
+        mEnv->PopLocalFrame(nullptr);
+        EXPECT_EQ(JavaMachine::TakeOutput(), "") << "JNI's own checks have something to say";
+    }
+
+    void Load() {
+        LogCapture const quiet;
+        ASSERT_EQ(MKBitmapFactory_OnLoad(JavaMachine::GetVm(), mEnv), 1);
+    }
+    void SetResult(jobject javaBitmap) {
+        jfieldID const field = mEnv->GetStaticFieldID(mFactory, "result", kBitmapType);
+        mEnv->SetStaticObjectField(mFactory, field, javaBitmap);
+    }
+    void SetThrowing(bool on) {
+        mEnv->SetStaticBooleanField(mFactory, mEnv->GetStaticFieldID(mFactory, "isThrowing", "Z"), on);
+    }
+    String GetString(char const* name) {
+        jfieldID const field = mEnv->GetStaticFieldID(mFactory, name, kStringType);
+        auto const string = static_cast<jstring>(mEnv->GetStaticObjectField(mFactory, field));
+        std::u16string text(static_cast<std::size_t>(mEnv->GetStringLength(string)), u'\0');
+        mEnv->GetStringRegion(string, 0, mEnv->GetStringLength(string),
+                              reinterpret_cast<jchar*>(text.data()));
+        mEnv->DeleteLocalRef(string);
+        return String(text.data(), static_cast<int>(text.size()));
+    }
+
+    // Two pixels, one over the other.
+    jobject MakeJavaBitmap(char const* config, char const* failing) {
+        unsigned char const pixels[] = {10, 20, 30, 40, 0, 255, 1, 254};
+        jbyteArray const array = mEnv->NewByteArray(sizeof pixels);
+        mEnv->SetByteArrayRegion(array, 0, sizeof pixels, reinterpret_cast<jbyte const*>(pixels));
+        jclass const type = mEnv->FindClass(kBitmap);
+        jmethodID const init =
+            mEnv->GetMethodID(type, "<init>", "(IIILjava/lang/String;[BLjava/lang/String;)V");
+        jobject const made = mEnv->NewObject(type, init, 1, 2, 4, mEnv->NewStringUTF(config), array,
+                                             mEnv->NewStringUTF(failing));
+        EXPECT_FALSE(mEnv->ExceptionCheck());
+        return made;
+    }
+    int GetRecycled(jobject javaBitmap) {
+        return mEnv->GetIntField(javaBitmap,
+                                 mEnv->GetFieldID(mEnv->GetObjectClass(javaBitmap), "recycled", "I"));
+    }
+
+    // A file that the base library reads, 3 x 2.
+    String SaveFile() {
+        Bytes pixels(3 * 2 * 4, 255);
+        Bitmap bitmap;
+        EXPECT_TRUE(bitmap.Construct(pixels.data(), 3, 2, 12, Bitmap::kFormatRgba8888, false, false));
+        String const path((std::filesystem::path(testing::TempDir()) / "bridge.webp").string());
+        EXPECT_TRUE(BitmapFactory::SaveBitmap(&bitmap, &path, 100));
+        return path;
+    }
+
+    JNIEnv* const mEnv = JavaMachine::GetMainEnv();
+    jclass mFactory = nullptr;
+};
+
+TEST_F(DecodeBridge, RefusesUntilItIsLoadedWhateverThePath) {
+    String const path("/a.png");
+    String const empty;
+    for (String const* any : {&path, &empty, static_cast<String const*>(nullptr)}) {
+        LogCapture log;
+        EXPECT_EQ(CreateBitmapJNI(any, 1, 1), nullptr);
+        EXPECT_THAT(log.GetTexts(), ElementsAre(kNotLoaded));
+        EXPECT_EQ(log.Count(ANDROID_LOG_ERROR), 1);
+    }
+}
+
+TEST_F(DecodeBridge, SaysWhatIsMissingAndGoesOnWithWhatIsThere) {
+    constexpr char const* kEnter = "MKBitmapFactory JNI_OnLoad enter!!";
+    constexpr char const* kSuccess = "MKBitmapFactory JNI_OnLoad Success";
+    String const path("/a.png");
+    struct {
+        char const* hidden;
+        char const* message;
+        int result;
+        bool isDecoding;
+        int recycled;
+    } const cases[] = {
+        {"decodeFile", "MKBitmapFactory Cannot find 'gDecodeFile' method id", 1, false, 0},
+        {kBitmap, "MKBitmapFactory Cannot find Bitmap Class", 0, true, 0},
+        {"recycle", "MKBitmapFactory Cannot find 'gRecycle' method id", 1, true, 0},
+        {"nothing", nullptr, 1, true, 1},
+    };
+    for (auto const& [name, message, result, isDecoding, recycled] : cases) {
+        SCOPED_TRACE(name);
+        jobject const javaBitmap = MakeJavaBitmap("ARGB_8888", "");
+        SetResult(javaBitmap);
+        LogCapture log;
+        EXPECT_EQ(LoadWithout(name), result);
+        std::vector<std::string> expected{kEnter};
+        if (message) expected.push_back(message);
+        if (result == 1) expected.push_back(kSuccess);
+        EXPECT_EQ(log.GetTexts(), expected);
+        EXPECT_EQ(log.Count(ANDROID_LOG_ERROR), message ? 1 : 0);
+        EXPECT_EQ(BitmapOwner(CreateBitmapJNI(&path, 0, 0)) != nullptr, isDecoding);
+        EXPECT_EQ(log.Has(kNotLoaded), !isDecoding);
+        // Where the class is not looked into, an earlier case's method is still known.
+        if (result == 1) {
+            EXPECT_EQ(GetRecycled(javaBitmap), recycled);
+        }
+    }
+    LogCapture log;
+    EXPECT_EQ(LoadWithout(kFactory), 0);
+    EXPECT_THAT(log.GetTexts(), ElementsAre(kEnter, "MKBitmapFactory Cannot find MokaBitmapFactory Class"));
+}
+
+TEST_F(DecodeBridge, HandsOverPathAndSizeAndTakesThePixels) {
+    Load();
+    // A surrogate pair, half of one, and a zero in the middle.
+    char16_t const text[] = {u'/', 0x00e9, 0xd83d, 0xde00, 0xd800, 0, u'.', u'p', u'n', u'g'};
+    String const path(text, static_cast<int>(std::size(text)));
+    jobject const javaBitmap = MakeJavaBitmap("ARGB_8888", "");
+    SetResult(javaBitmap);
+    LogCapture log;
+    BitmapOwner const bitmap(CreateBitmapJNI(&path, -7, 2000000000));
+    EXPECT_EQ(GetString("path"), path);
+    EXPECT_EQ(GetString("size"), String("-7x2000000000"));
+    ASSERT_TRUE(bitmap);
+    EXPECT_EQ(bitmap->GetWidth(), 1);
+    EXPECT_EQ(bitmap->GetHeight(), 2);
+    EXPECT_EQ(bitmap->GetStride(), 4);
+    EXPECT_EQ(bitmap->GetFormat(), Bitmap::kFormatRgba8888);
+    EXPECT_TRUE(bitmap->GetDeleteBuffer());
+    EXPECT_EQ(Bytes(bitmap->GetBuffer(), bitmap->GetBuffer() + 8), (Bytes{10, 20, 30, 40, 0, 255, 1, 254}));
+    EXPECT_EQ(GetRecycled(javaBitmap), 1);
+    ASSERT_EQ(log.GetLines().size(), 1u);
+    EXPECT_EQ(log.GetLines()[0].format, "MKBitmapFactory::CreateBitmapJNI - filename[%s]");
+    EXPECT_THAT(log.GetLines()[0].text, HasSubstr("[/****"));
+}
+
+TEST_F(DecodeBridge, AsksNobodyWithoutAPath) {
+    Load();
+    String const empty;
+    LogCapture log;
+    EXPECT_EQ(CreateBitmapJNI(nullptr, 1, 1), nullptr);
+    EXPECT_EQ(CreateBitmapJNI(&empty, 1, 1), nullptr);
+    EXPECT_THAT(log.GetTexts(),
+                ElementsAre("MKBitmapFactory : filename NULL",
+                            "MKBitmapFactory::CreateBitmapJNI - filename[]", "MKBitmapFactory : filename 0"));
+}
+
+TEST_F(DecodeBridge, WhatJavaCannotReadTheBaseLibraryReads) {
+    Load();
+    String const good = SaveFile();
+    String const bad("/no/such.png");
+    for (bool isThrowing : {false, true}) {
+        SetThrowing(isThrowing);
+        LogCapture log;
+        BitmapOwner const bitmap(CreateBitmapJNI(&good, 9, 9));
+        ASSERT_TRUE(bitmap);
+        EXPECT_EQ(bitmap->GetWidth(), 3) << "at the file's own size";
+        EXPECT_FALSE(mEnv->ExceptionCheck());
+        EXPECT_EQ(log.Count(ANDROID_LOG_ERROR, "decodeFile threw"), isThrowing ? 1 : 0);
+        EXPECT_EQ(CreateBitmapJNI(&bad, 0, 0), nullptr);
+        EXPECT_FALSE(mEnv->ExceptionCheck());
+    }
+}
+
+TEST_F(DecodeBridge, RefusesOtherConfigurationsAndLeavesThemToTheirOwner) {
+    Load();
+    jobject const javaBitmap = MakeJavaBitmap("RGB_565", "");
+    SetResult(javaBitmap);
+    String const path("/a.jpg");
+    LogCapture log;
+    EXPECT_EQ(CreateBitmapJNI(&path, 0, 0), nullptr);
+    EXPECT_THAT(log.GetTexts(ANDROID_LOG_ERROR),
+                ElementsAre(HasSubstr("RGB_565"), "MKBitmapFactory : getMKBitmap false"));
+    EXPECT_EQ(GetRecycled(javaBitmap), 0);
+}
+
+TEST_F(DecodeBridge, KeepsThePixelsOfABitmapThatCannotBeRecycled) {
+    Load();
+    SetResult(MakeJavaBitmap("ARGB_8888", "recycle"));
+    String const path("/a.jpg");
+    LogCapture log;
+    EXPECT_TRUE(BitmapOwner(CreateBitmapJNI(&path, 0, 0)));
+    EXPECT_EQ(log.Count(ANDROID_LOG_ERROR, "recycle threw"), 1);
+}
+
+TEST_F(DecodeBridge, LeavesThreadsAttachedAsItFoundThem) {
+    Load();
+    SetResult(MakeJavaBitmap("ARGB_8888", ""));
+    String const path("/a.jpg");
+    std::thread([&] {
+        LogCapture const quiet;
+        void* env = nullptr;
+        EXPECT_TRUE(BitmapOwner(CreateBitmapJNI(&path, 0, 0)));
+        EXPECT_EQ(JavaMachine::GetVm()->GetEnv(&env, JNI_VERSION_1_6), JNI_EDETACHED);
+    }).join();
+    EXPECT_NE(GetString("thread"), String("main"));
+    EXPECT_TRUE(BitmapOwner(CreateBitmapJNI(&path, 0, 0)));
+    EXPECT_EQ(GetString("thread"), String("main"));
+    void* env = nullptr;
+    EXPECT_EQ(JavaMachine::GetVm()->GetEnv(&env, JNI_VERSION_1_6), JNI_OK);
+}
+
+// On a thread that never returns to Java nobody else would end them; the VM's checks report when too many
+// gather.
+TEST_F(DecodeBridge, GathersNoLocalReferences) {
+    Load();
+    LogCapture const quiet;
+    jobject const results[] = {MakeJavaBitmap("ARGB_8888", ""), MakeJavaBitmap("ARGB_8888", "recycle"),
+                               MakeJavaBitmap("ALPHA_8", ""), nullptr};
+    String const path("/no/such.jpg");
+    for (jobject result : results) {
+        SetResult(result);
+        for (bool isThrowing : {false, true}) {
+            SetThrowing(isThrowing);
+            for (int i = 0; i < 200; ++i) BitmapOwner(CreateBitmapJNI(&path, 0, 0));
+        }
+    }
+}
+
+} // namespace
+} // namespace Moka::Testing

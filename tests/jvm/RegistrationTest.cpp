@@ -1,0 +1,103 @@
+// What Java hands to the natives that are registered, and what the loading says.
+#include "moka/base/log/AndroidLog.h"
+#include "moka/graphics/jni/Display.h"
+#include "moka/graphics/jni/OnLoad.h"
+#include "tests/jvm/JavaMachine.h"
+#include "tests/jvm/PatchedFunctions.h"
+#include "tests/support/LogCapture.h"
+
+#include <cstdint>
+#include <cstring>
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+#include <memory>
+#include <string>
+#include <vector>
+
+namespace Moka::Testing {
+namespace {
+
+using testing::ElementsAre;
+
+std::vector<JNINativeMethod> registered;
+jint registration;
+JNINativeInterface_ const* original;
+
+// The VM's own classes come by as well: looking ours up may be the first use of them.
+jint JNICALL RegisterNatives(JNIEnv* env, jclass type, JNINativeMethod const* methods, jint count) {
+    if (std::strncmp(methods->name, "Native_", 7) != 0)
+        return original->RegisterNatives(env, type, methods, count);
+    registered.assign(methods, methods + count);
+    return registration;
+}
+
+// The display's natives, as they would be registered.
+std::vector<std::string> LoadDisplay(jint result) {
+    PatchedFunctions functions(JavaMachine::GetMainEnv());
+    functions->RegisterNatives = &RegisterNatives;
+    original = &functions.GetOriginal();
+    registration = result;
+    LogCapture log;
+    Display_OnLoad(JavaMachine::GetVm());
+    for (LogLine const& line : log.GetLines()) {
+        EXPECT_EQ(line.tag, "DisplayGlue");
+        EXPECT_EQ(line.priority, ANDROID_LOG_INFO);
+    }
+    return log.GetTexts();
+}
+
+template <class Function>
+Function* GetNative(std::size_t index) {
+    return reinterpret_cast<Function*>(registered.at(index).fnPtr);
+}
+
+TEST(Registration, DisplayHasFiveNativesInOrder) {
+    EXPECT_THAT(LoadDisplay(0), ElementsAre("Display JNI_OnLoad enter!!", "Display JNI_OnLoad Success"));
+    std::vector<std::string> texts;
+    for (JNINativeMethod const& method : registered)
+        texts.push_back(std::string(method.name) + method.signature);
+    EXPECT_THAT(texts, ElementsAre("Native_init(IIFIIFFIFFIIIZJ)J", "Native_finalize(J)V", "Native_copy(JJ)V",
+                                   "Native_setDebugLevel(JI)V", "Native_updateScreenOrientation(JI)V"));
+    EXPECT_THAT(LoadDisplay(-1), ElementsAre("Display JNI_OnLoad enter!!", "RegisterNatives is failed"));
+}
+
+// The VM itself hands natives 0 and 1 only.
+TEST(Registration, AnyTruthOfJavasMakesATablet) {
+    LoadDisplay(0);
+    auto* const init = GetNative<jlong(JNIEnv*, jclass, jint, jint, jfloat, jint, jint, jfloat, jfloat, jint,
+                                       jfloat, jfloat, jint, jint, jint, jboolean, jlong)>(0);
+    auto* const finalize = GetNative<void(JNIEnv*, jclass, jlong)>(1);
+    for (int truth : {0, 1, 2, 255}) {
+        jlong const handle =
+            init(nullptr, nullptr, 1, 1, 1, 1, 1, 1, 1, 1, 1, 1, 1, 1, 1, static_cast<jboolean>(truth), 0);
+        ASSERT_NE(handle, 0);
+        auto const* const display = reinterpret_cast<Display const*>(static_cast<std::intptr_t>(handle));
+        EXPECT_EQ(display->IsTablet(), truth != 0);
+        EXPECT_FALSE(display->IsUWP());
+        finalize(nullptr, nullptr, handle);
+    }
+    finalize(nullptr, nullptr, 0);
+}
+
+TEST(Registration, AVmThatIsTooOldIsRefused) {
+    JNIInvokeInterface_ functions = {};
+    JavaVM vm = {};
+    vm.functions = &functions;
+    static std::vector<jint> versions;
+    versions.clear();
+    functions.GetEnv = [](JavaVM*, void**, jint version) -> jint {
+        versions.push_back(version);
+        return JNI_EVERSION;
+    };
+    LogCapture log;
+    EXPECT_EQ(JNI_OnLoad(&vm, nullptr), 0);
+    EXPECT_THAT(log.GetTexts(), ElementsAre("Graphics JNI_OnLoad enter!!", "JNI_VERSION is different"));
+    EXPECT_EQ(log.Find("JNI_VERSION is different").priority, ANDROID_LOG_ERROR);
+    log.Clear();
+    Display_OnLoad(&vm);
+    EXPECT_THAT(log.GetTexts(), ElementsAre("Display JNI_OnLoad enter!!", "Display : Cannot find env"));
+    EXPECT_THAT(versions, ElementsAre(0x10004, 0x10002));
+}
+
+} // namespace
+} // namespace Moka::Testing

@@ -1,0 +1,4 @@
+package com.velmora.android.sdk.pen.graphics;
+
+/** Without its native. */
+public final class MokaBitmapLoader {}

@@ -1,0 +1,4 @@
+package com.velmora.android.sdk.pen.view;
+
+/** Without its natives. */
+public final class MokaDisplay {}
