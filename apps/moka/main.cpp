@@ -1,7 +1,9 @@
 // moka: the command-line tool. Exit status: 0 done, 1 failed, 2 wrong usage; every failure is one line on
 // stderr.
 #include "apps/moka/ConvertCommand.h"
+#include "apps/moka/DrawCommand.h"
 #include "apps/moka/Failure.h"
+#include "apps/moka/GalleryCommand.h"
 #include "apps/moka/InfoCommand.h"
 #include "moka/base/System.h"
 #include "moka/base/log/AndroidLog.h"
@@ -25,7 +27,7 @@ std::string Explain(CLI::App const& app, CLI::ParseError const& error) {
     if (!commands.empty())
         return std::string(error.what()) + "; see moka " + commands.front()->get_name() + " --help";
     auto const unknown = app.remaining();
-    if (unknown.empty()) return "name a command, convert or info; see moka --help";
+    if (unknown.empty()) return "name a command, for instance convert or info; see moka --help";
     bool const isOption = unknown.front().front() == '-';
     return (isOption ? "unknown option '" : "unknown command '") + unknown.front() + "'; see moka --help";
 }
@@ -51,6 +53,8 @@ int Run(int argc, char** argv) {
     app.set_version_flag("--version", "moka " MOKA_VERSION);
     app.require_subcommand(1);
     Moka::Tool::AddConvertCommand(app);
+    Moka::Tool::AddDrawCommand(app);
+    Moka::Tool::AddGalleryCommand(app);
     Moka::Tool::AddInfoCommand(app);
     int const status = Parse(app, argc, argv);
     FlushOutput();

@@ -5,12 +5,17 @@
 #include "moka/base/String.h"
 
 #include <algorithm>
+#include <cctype>
 #include <cstdint>
 #include <cstdlib>
+#include <filesystem>
 #include <ostream>
+#include <system_error>
 
 namespace Moka::Testing {
 namespace {
+
+constexpr Color kAllowed{120, 150, 255, 255};
 
 int LargestDifference(unsigned char const* a, unsigned char const* b) {
     int largest = 0;
@@ -27,8 +32,9 @@ Color OnWhite(unsigned char const* pixel) {
     return {blend(0), blend(1), blend(2), 255};
 }
 
-Color ShowDifference(unsigned char const* a, unsigned char const* b) {
+Color ShowDifference(unsigned char const* a, unsigned char const* b, int slack) {
     int const difference = LargestDifference(a, b);
+    if (difference > 0 && difference <= slack) return kAllowed;
     if (difference > 0) return {static_cast<unsigned char>(128 + difference / 2), 0, 0, 255};
     Color const color = OnWhite(a);
     auto const grey = static_cast<unsigned char>(160 + (color[0] + color[1] + color[2]) / 9);
@@ -43,41 +49,42 @@ std::ostream& operator<<(std::ostream& stream, ImageDifference const& difference
                   << " on average";
 }
 
-ImageDifference CompareImages(unsigned char const* a, unsigned char const* b, int width, int height) {
+ImageDifference CompareImages(unsigned char const* a, unsigned char const* b, int width, int height,
+                              Slack const* slack) {
     ImageDifference result;
     std::int64_t sum = 0;
     std::size_t offset = 0;
     for (int y = 0; y < height; ++y) {
         for (int x = 0; x < width; ++x, offset += 4) {
             int const largest = LargestDifference(a + offset, b + offset);
-            if (largest == 0) continue;
-            if (result.differingPixels++ == 0) {
-                result.firstX = x;
-                result.firstY = y;
-            }
+            if (largest <= (slack ? slack->Get(x, y) : 0)) continue;
             result.largest = std::max(result.largest, largest);
             for (std::size_t i = offset; i < offset + 4; ++i) sum += std::abs(a[i] - b[i]);
+            if (result.differingPixels++ > 0) continue;
+            result.firstX = x;
+            result.firstY = y;
         }
     }
     if (offset > 0) result.mean = static_cast<double>(sum) / static_cast<double>(offset);
     return result;
 }
 
-ImageDifference CompareImages(TestImage const& a, TestImage const& b) {
+ImageDifference CompareImages(TestImage const& a, TestImage const& b, Slack const* slack) {
     if (a.width == b.width && a.height == b.height) {
-        return CompareImages(a.pixels.data(), b.pixels.data(), a.width, a.height);
+        return CompareImages(a.pixels.data(), b.pixels.data(), a.width, a.height, slack);
     }
     return {static_cast<int>(std::max(a.pixels.size(), b.pixels.size()) / 4), 255, 255, 0, 0};
 }
 
-bool WriteDifference(TestImage const& a, TestImage const& b, std::string const& path) {
+bool WriteDifference(TestImage const& a, TestImage const& b, std::string const& path, Slack const* slack) {
     int const width = std::min(a.width, b.width);
     int const height = std::min(a.height, b.height);
     TestImage sheet(width * 3, height);
     for (int y = 0; y < height; ++y) {
         for (int x = 0; x < width; ++x) {
             sheet.SetColor(x, y, OnWhite(a.At(x, y)));
-            sheet.SetColor(x + width, y, ShowDifference(a.At(x, y), b.At(x, y)));
+            sheet.SetColor(x + width, y,
+                           ShowDifference(a.At(x, y), b.At(x, y), slack ? slack->Get(x, y) : 0));
             sheet.SetColor(x + 2 * width, y, OnWhite(b.At(x, y)));
         }
     }
@@ -88,6 +95,19 @@ bool WriteDifference(TestImage const& a, TestImage const& b, std::string const& 
     }
     String const file(path);
     return BitmapFactory::SaveBitmap(&bitmap, &file, 100);
+}
+
+std::string KeepDifference(TestImage const& expected, TestImage const& actual, std::string name,
+                           Slack const* slack) {
+    for (char& c : name) {
+        if (!std::isalnum(static_cast<unsigned char>(c))) c = '-';
+    }
+    std::error_code error;
+    std::filesystem::path const folder = std::filesystem::absolute("differences", error);
+    std::filesystem::create_directories(folder, error);
+    std::string const path = (folder / (name + ".png")).string();
+    if (!WriteDifference(expected, actual, path, slack)) return "the picture of it could not be written";
+    return "expected, difference and actual: " + path;
 }
 
 } // namespace Moka::Testing

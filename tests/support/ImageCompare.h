@@ -4,29 +4,63 @@
 
 #include "tests/support/TestImages.h"
 
+#include <algorithm>
 #include <iosfwd>
 #include <string>
+#include <vector>
 
 namespace Moka::Testing {
 
+// How far each pixel of an image may be off, in steps of any channel. 255 is anything.
+class Slack {
+public:
+    Slack(int width, int height)
+        : mWidth(width), mSteps(static_cast<std::size_t>(width) * static_cast<std::size_t>(height)) {}
+
+    int Get(int x, int y) const { return mSteps[GetIndex(x, y)]; }
+    void Set(int x, int y, int steps) {
+        mSteps[GetIndex(x, y)] = static_cast<unsigned char>(std::clamp(steps, 0, 255));
+    }
+    // The pixels that may be off by more.
+    int CountOver(int steps) const {
+        return static_cast<int>(
+            std::count_if(mSteps.begin(), mSteps.end(), [steps](int s) { return s > steps; }));
+    }
+
+private:
+    std::size_t GetIndex(int x, int y) const {
+        return static_cast<std::size_t>(y) * static_cast<std::size_t>(mWidth) + static_cast<std::size_t>(x);
+    }
+
+    int mWidth;
+    std::vector<unsigned char> mSteps;
+};
+
 struct ImageDifference {
-    int differingPixels = 0;
-    int largest = 0; // of any channel of any pixel
-    double mean = 0; // over all channels of all pixels
-    int firstX = -1; // of the first differing pixel in reading order; -1 when there is none
+    int differingPixels = 0; // by more than they may
+    int largest = 0;         // of any channel of these
+    double mean = 0;         // of these, over all channels of all pixels
+    int firstX = -1;         // of the first differing pixel in reading order; -1 when there is none
     int firstY = -1;
 };
 
 // So that a failing test says it all.
 std::ostream& operator<<(std::ostream& stream, ImageDifference const& difference);
 
-ImageDifference CompareImages(unsigned char const* a, unsigned char const* b, int width, int height);
+ImageDifference CompareImages(unsigned char const* a, unsigned char const* b, int width, int height,
+                              Slack const* slack = nullptr);
 // Images of different sizes differ everywhere, by 255.
-ImageDifference CompareImages(TestImage const& a, TestImage const& b);
+ImageDifference CompareImages(TestImage const& a, TestImage const& b, Slack const* slack = nullptr);
 
 // Writes a PNG of both images and, between them, their difference: grey and dim where they agree, red by the
-// largest channel difference (at least half bright) where not. Each is shown on white. False when the file
-// cannot be written (one error line).
-bool WriteDifference(TestImage const& a, TestImage const& b, std::string const& path);
+// largest channel difference (at least half bright) where not, blue where they may. Each is shown on white.
+// False when the file cannot be written (one error line).
+bool WriteDifference(TestImage const& a, TestImage const& b, std::string const& path,
+                     Slack const* slack = nullptr);
+
+// For a failed test: writes the difference as differences/NAME.png in the working directory, whatever
+// characters the name has, and returns a line that says where.
+std::string KeepDifference(TestImage const& expected, TestImage const& actual, std::string name,
+                           Slack const* slack = nullptr);
 
 } // namespace Moka::Testing

@@ -1,0 +1,169 @@
+#include "apps/moka/GalleryCommand.h"
+
+#include "apps/moka/Arguments.h"
+#include "apps/moka/Failure.h"
+#include "apps/moka/GalleryPage.h"
+#include "apps/moka/Interruption.h"
+#include "apps/moka/LogCollector.h"
+#include "apps/moka/Progress.h"
+#include "apps/moka/SceneDrawing.h"
+
+#include <CLI/CLI.hpp>
+#include <algorithm>
+#include <cstdio>
+#include <filesystem>
+#include <fstream>
+#include <memory>
+#include <string>
+#include <vector>
+
+namespace Moka::Tool {
+namespace {
+
+namespace fs = std::filesystem;
+
+using Scenes::Scene;
+
+constexpr char kDescription[] = "Draw every scene there is onto PNGs, and a page that shows them";
+constexpr char kFooter[] =
+    "    moka gallery --out gallery                 all, and gallery/index.html to open in a browser\n"
+    "    moka gallery --out gallery --only clips    one of them\n"
+    "    moka gallery --list                        what there is; draws nothing";
+
+struct GalleryOptions {
+    std::string folder;
+    std::vector<std::string> only;
+    bool list = false;
+};
+
+struct Gallery {
+    std::vector<GalleryPicture> pictures;
+    std::vector<Scenes::Picture> pixels; // one for each
+    std::string device;
+};
+
+void PrintList() {
+    for (Scene const& scene : Scenes::GetScenes())
+        std::printf("%-22s %4dx%-4d %s\n", scene.name.c_str(), scene.width, scene.height,
+                    scene.about.c_str());
+}
+
+void CheckNames(std::vector<std::string> const& names) {
+    for (std::string const& name : names) {
+        if (!Scenes::FindScene(name))
+            throw Failure(ExitStatus::Usage, "there is no scene '" + name + "'; see moka gallery --list");
+    }
+}
+
+std::vector<GalleryPicture> ChoosePictures(std::vector<std::string> const& only) {
+    std::vector<GalleryPicture> pictures;
+    for (Scene const& scene : Scenes::GetScenes()) {
+        if (!only.empty() && std::find(only.begin(), only.end(), scene.name) == only.end()) continue;
+        pictures.push_back({&scene, false});
+        if (scene.alsoInStrips) pictures.push_back({&scene, true});
+    }
+    return pictures;
+}
+
+// Each kind of target has a render thread of its own, one after the other.
+RenderThreadOptions OptionsFor(GalleryPicture const& picture) {
+    RenderThreadOptions options;
+    if (picture.isInStrips) options.limits.maxTextureSize = GetSideForThreeStrips(*picture.scene);
+    if (picture.scene->onScreen) {
+        options.surfaceWidth = picture.scene->width;
+        options.surfaceHeight = picture.scene->height;
+    }
+    return options;
+}
+
+bool IsSameTarget(RenderThreadOptions const& a, RenderThreadOptions const& b) {
+    return a.limits.maxTextureSize == b.limits.maxTextureSize && a.surfaceWidth == b.surfaceWidth &&
+           a.surfaceHeight == b.surfaceHeight;
+}
+
+void DrawAll(Gallery& gallery, LogCollector& log, Progress& progress) {
+    std::unique_ptr<RenderThread> queue;
+    RenderThreadOptions current;
+    for (GalleryPicture const& picture : gallery.pictures) {
+        progress.SetStage(picture.scene->name.c_str());
+        RenderThreadOptions const options = OptionsFor(picture);
+        if (!queue || !IsSameTarget(options, current)) {
+            queue.reset(); // there may be one only
+            queue = StartForScene(options, log);
+            current = options;
+        }
+        gallery.pixels.push_back(DrawOnGpu(*picture.scene, *queue, log));
+        gallery.device = queue->GetContextInfo().renderer;
+    }
+}
+
+void MakeFolder(std::string const& folder) {
+    std::error_code error;
+    fs::create_directories(folder, error);
+    if (error) throw Failure("cannot make the folder " + folder + ": " + error.message());
+    CheckFolder(folder, folder, ExitStatus::Failed);
+}
+
+// Under its name only when it is whole. The other name is one that Interruption knows.
+void SavePage(std::string const& page, std::string const& folder, Interruption& interruption) {
+    fs::path const path = fs::path(folder) / "index.html";
+    fs::path const temporary = fs::path(folder) / ".index.html.galley.tmp";
+    Interruption::Saving const saving(interruption);
+    std::ofstream file(temporary, std::ios::binary);
+    file << page;
+    file.close();
+    std::error_code error;
+    if (file) fs::rename(temporary, path, error);
+    if (file && !error) return;
+    fs::remove(temporary, error);
+    throw Failure("cannot write " + path.string());
+}
+
+void SaveAll(Gallery const& gallery, std::string const& folder, LogCollector const& log,
+             Interruption& interruption) {
+    for (std::size_t i = 0; i < gallery.pictures.size(); ++i)
+        SavePicture(gallery.pixels[i], (fs::path(folder) / (gallery.pictures[i].GetName() + ".png")).string(),
+                    log, interruption);
+    SavePage(MakeGalleryPage(gallery.pictures, gallery.device), folder, interruption);
+}
+
+// Everything is drawn before anything is written, so that a failure leaves no half of a gallery.
+void RunGallery(GalleryOptions const& options) {
+    if (options.list) return PrintList();
+    if (options.folder.empty())
+        throw Failure(ExitStatus::Usage,
+                      "name a folder with --out, or ask for --list; see moka gallery --help");
+    CheckNames(options.only);
+    Gallery gallery;
+    gallery.pictures = ChoosePictures(options.only);
+    {
+        Interruption interruption;
+        LogCollector log(false);
+        Progress progress(true);
+        DrawAll(gallery, log, progress);
+        progress.SetStage("save the pictures");
+        MakeFolder(options.folder);
+        SaveAll(gallery, options.folder, log, interruption);
+    }
+    for (GalleryPicture const& picture : gallery.pictures)
+        std::printf("%s\n", (fs::path(options.folder) / (picture.GetName() + ".png")).c_str());
+    std::printf("%s\n", (fs::path(options.folder) / "index.html").c_str());
+}
+
+} // namespace
+
+void AddGalleryCommand(CLI::App& app) {
+    auto const options = std::make_shared<GalleryOptions>();
+    CLI::App* const command = app.add_subcommand("gallery", kDescription);
+    command->footer(kFooter);
+    command
+        ->add_option("--out", options->folder,
+                     "The folder to write to, made if need be; pictures of the same names there are replaced")
+        ->type_name("DIR")
+        ->check(CLI::Validator(CheckPath, ""));
+    command->add_option("--only", options->only, "Only the scenes of these names")->type_name("NAME");
+    command->add_flag("--list", options->list, "Tell the names, sizes and sentences of all scenes");
+    command->callback([options] { RunGallery(*options); });
+}
+
+} // namespace Moka::Tool

@@ -1,0 +1,58 @@
+#include "apps/moka/SceneDrawing.h"
+
+#include "apps/moka/Failure.h"
+#include "apps/moka/Interruption.h"
+#include "apps/moka/LogCollector.h"
+#include "moka/base/Bitmap.h"
+#include "moka/base/BitmapFactory.h"
+#include "moka/base/String.h"
+#include "scenes/SceneError.h"
+
+namespace Moka::Tool {
+namespace {
+
+constexpr int kJpegQuality = 90;
+constexpr int kLosslessQuality = 100;
+
+int GetQuality(String const& path) {
+    return BitmapFactory::GetFormatByExtension(&path) == ImageFormat::Jpeg ? kJpegQuality : kLosslessQuality;
+}
+
+} // namespace
+
+std::unique_ptr<RenderThread> StartForScene(RenderThreadOptions const& options, LogCollector& log) {
+    std::string error;
+    std::unique_ptr<RenderThread> queue = RenderThread::Start(options, &error);
+    if (!queue) throw Failure(error);
+    // What was tried in vain before a driver answered is no failure.
+    log.Clear();
+    return queue;
+}
+
+Scenes::Picture DrawOnGpu(Scenes::Scene const& scene, RenderThread& queue, LogCollector const& log) {
+    int const largest = queue.GetContextInfo().maxTextureSize;
+    if (scene.width > largest)
+        throw Failure(scene.name + " is " + std::to_string(scene.width) +
+                      " pixels wide; this device takes textures up to " + std::to_string(largest));
+    try {
+        Scenes::Picture picture = RenderScene(scene, queue);
+        std::string const error = log.GetError();
+        if (error.empty()) return picture;
+        throw Failure(scene.name + ": " + error);
+    } catch (Scenes::SceneError const& error) {
+        log.Throw(error.what());
+    }
+}
+
+void SavePicture(Scenes::Picture const& picture, std::string const& path, LogCollector const& log,
+                 Interruption& interruption) {
+    Bitmap image;
+    // Only read; the bitmap has no constant form.
+    image.Construct(const_cast<unsigned char*>(picture.pixels.data()), picture.width, picture.height,
+                    static_cast<int>(picture.GetStride()), Bitmap::kFormatRgba8888, false, false);
+    String const name(path);
+    Interruption::Saving const saving(interruption);
+    if (!BitmapFactory::SaveBitmap(&image, &name, GetQuality(name))) log.Throw("cannot save " + path);
+}
+
+} // namespace Moka::Tool

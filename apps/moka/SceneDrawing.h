@@ -1,0 +1,25 @@
+// SceneDrawing.h: what drawing one scene and drawing the gallery have in common.
+// Fails: throws Failure.
+#pragma once
+
+#include "moka/host/RenderThread.h"
+#include "scenes/SceneRenderer.h"
+
+#include <memory>
+#include <string>
+
+namespace Moka::Tool {
+
+class Interruption;
+class LogCollector;
+
+// Clears the log.
+std::unique_ptr<RenderThread> StartForScene(RenderThreadOptions const& options, LogCollector& log);
+
+Scenes::Picture DrawOnGpu(Scenes::Scene const& scene, RenderThread& queue, LogCollector const& log);
+
+// In the format of the extension: JPEG at quality 90, the others with every pixel.
+void SavePicture(Scenes::Picture const& picture, std::string const& path, LogCollector const& log,
+                 Interruption& interruption);
+
+} // namespace Moka::Tool

@@ -1,0 +1,28 @@
+#include "bench/canvas/AllocationCount.h"
+
+#include "moka/base/Export.h"
+
+#include <cstdlib>
+#include <new>
+
+namespace {
+
+thread_local std::uint64_t tAllocations = 0;
+
+} // namespace
+
+namespace Moka::Bench {
+
+std::uint64_t CountAllocations() { return tAllocations; }
+
+} // namespace Moka::Bench
+
+// The other forms of new come down to this one.
+MOKA_API void* operator new(std::size_t size) {
+    ++tAllocations;
+    if (void* const memory = std::malloc(size > 0 ? size : 1)) return memory;
+    throw std::bad_alloc();
+}
+
+MOKA_API void operator delete(void* memory) noexcept { std::free(memory); }
+MOKA_API void operator delete(void* memory, std::size_t) noexcept { std::free(memory); }

@@ -1,0 +1,53 @@
+// BenchCanvas: a caller-side canvas over a bitmap of its own, and what the benchmarks draw on it.
+#pragma once
+
+#include "bench/canvas/Frame.h"
+#include "moka/base/RefPtr.h"
+#include "moka/graphics/bitmap/IMKBitmap.h"
+#include "moka/graphics/bitmap/MKGraphicsFactory.h"
+#include "moka/graphics/canvas/IMKCanvas.h"
+#include "moka/graphics/canvas/MKPaint.h"
+#include "moka/host/RenderThread.h"
+
+namespace Moka::Bench {
+
+constexpr int kSide = 1024; // of the targets
+constexpr int kShapes = 5000;
+constexpr int kWarmUpFrames = 3;
+
+enum class Colors { Same, Distinct };
+
+inline RefPtr<IMKBitmap> MakeBitmap(int width, int height) {
+    return RefPtr<IMKBitmap>::Adopt(
+        MKGraphicsFactory::CreateBitmap(&GetRenderThread(), width, height, nullptr, false, 1, false));
+}
+
+struct BenchCanvas {
+    explicit BenchCanvas(int width = kSide, int height = kSide)
+        : bitmap(MakeBitmap(width, height)),
+          canvas(RefPtr<IMKCanvas>::Adopt(
+              MKGraphicsFactory::CreateCanvas(&GetRenderThread(), bitmap.Get(), 1))) {}
+
+    RefPtr<IMKBitmap> const bitmap;
+    RefPtr<IMKCanvas> const canvas;
+};
+
+// The top left corner of the shape number i of that size: spread over the target, at fractions of a pixel.
+inline PointF PlaceOf(int i, int size) {
+    int const room = kSide - size - 2;
+    return {static_cast<float>(1 + i * 37 % room) + 0.25f, static_cast<float>(1 + i * 91 % room) + 0.5f};
+}
+
+inline RectF BoxOf(int i, int size) {
+    PointF const place = PlaceOf(i, size);
+    return {place.x, place.y, place.x + static_cast<float>(size), place.y + static_cast<float>(size)};
+}
+
+inline Vector4<float> ColorOf(int i, Colors colors) {
+    if (colors == Colors::Same) i = 0;
+    return {static_cast<float>(i & 0xFF) / 255, static_cast<float>(i >> 8) / 255, 0.5f, 0.75f};
+}
+
+inline void SetColor(MKPaint& paint, Vector4<float> const& c) { paint.SetColor(c.x, c.y, c.z, c.w); }
+
+} // namespace Moka::Bench

@@ -1,0 +1,19 @@
+// SceneFile.h: scenes out of JSON. docs/scene-format.md describes the format.
+// Everything is checked, and images are decoded, before anything is drawn.
+// Fails: throws SceneError: "file:line: what is wrong and what was expected".
+#pragma once
+
+#include "scenes/Scene.h"
+
+#include <string>
+#include <string_view>
+
+namespace Moka::Scenes {
+
+// The scene's name is the file's, without folder and extension.
+Scene LoadScene(std::string const& path);
+
+// name stands for the file in messages; images lie relative to folder.
+Scene ParseScene(std::string_view text, std::string const& name, std::string const& folder);
+
+} // namespace Moka::Scenes

@@ -1,0 +1,17 @@
+// ScenePaint.h: paints of a scene, under the names that MKPaint gives its properties.
+#pragma once
+
+#include "moka/graphics/canvas/MKPaint.h"
+#include "scenes/SceneFields.h"
+
+#include <map>
+#include <string>
+
+namespace Moka::Scenes {
+
+using NamedPaints = std::map<std::string, MKPaint>;
+
+// A name out of those given, or an object; "base" in it names the paint that it changes.
+MKPaint ReadPaint(SceneValue const& value, std::string const& what, NamedPaints const& named);
+
+} // namespace Moka::Scenes

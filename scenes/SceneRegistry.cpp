@@ -1,0 +1,83 @@
+#include "scenes/CustomScenes.h"
+#include "scenes/SceneError.h"
+#include "scenes/SceneFile.h"
+#include "scenes/SceneTexts.h"
+
+#include <algorithm>
+#include <iterator>
+
+namespace Moka::Scenes {
+namespace {
+
+struct Entry {
+    SceneGroup group;
+    char const* name; // of a file in data
+    bool alsoInStrips = false;
+};
+
+// In the gallery's order.
+constexpr Entry kEntries[] = {
+    {SceneGroup::Rectangles, "rect-styles"},
+    {SceneGroup::Rectangles, "rect-widths"},
+    {SceneGroup::Rectangles, "rect-fractions"},
+    {SceneGroup::Rectangles, "rect-matrices"},
+    {SceneGroup::TransferModes, "modes-rectangles"},
+    {SceneGroup::TransferModes, "modes-bitmaps"},
+    {SceneGroup::Clips, "clips", true},
+    {SceneGroup::Clips, "clip-primitives", true},
+    {SceneGroup::Clips, "clip-combinations"},
+    {SceneGroup::Clips, "clip-clear"},
+    {SceneGroup::SaveAndRestore, "save-restore"},
+    {SceneGroup::SaveAndRestore, "save-flags"},
+    {SceneGroup::Bitmaps, "bitmap-whole"},
+    {SceneGroup::Bitmaps, "bitmap-parts"},
+    {SceneGroup::Bitmaps, "bitmap-turned"},
+    {SceneGroup::Bitmaps, "bitmap-tiles"},
+    {SceneGroup::Bitmaps, "bitmap-tall", true},
+    {SceneGroup::Bitmaps, "bitmap-batch"},
+    {SceneGroup::Bitmaps, "bitmap-darken-lighten"},
+    {SceneGroup::Lines, "line-caps"},
+    {SceneGroup::Lines, "line-dashes"},
+    {SceneGroup::Lines, "line-fan"},
+    {SceneGroup::Lines, "simple-lines"},
+    {SceneGroup::Circles, "circle-styles"},
+    {SceneGroup::Circles, "circle-sizes"},
+    {SceneGroup::Circles, "circle-matrices"},
+    {SceneGroup::RoundRectangles, "round-rect-styles"},
+    {SceneGroup::RoundRectangles, "round-rect-radii"},
+    {SceneGroup::RoundRectangles, "round-rect-matrices"},
+    {SceneGroup::Screen, "screen"},
+};
+
+Scene ReadEntry(Entry const& entry) {
+    SceneText const* const end = kSceneTexts + kSceneTextCount;
+    SceneText const* const text = std::find_if(kSceneTexts, end, [&](SceneText const& candidate) {
+        return std::string(entry.name) == candidate.name;
+    });
+    if (text == end) throw SceneError(std::string("there is no file of the scene ") + entry.name);
+    Scene scene = ParseScene(text->text, std::string("scenes/data/") + entry.name + ".json", "");
+    scene.name = entry.name;
+    scene.group = entry.group;
+    scene.alsoInStrips = entry.alsoInStrips;
+    scene.onScreen = entry.group == SceneGroup::Screen;
+    return scene;
+}
+
+std::vector<Scene> MakeScenes() {
+    std::vector<Scene> scenes;
+    std::transform(std::begin(kEntries), std::end(kEntries), std::back_inserter(scenes), ReadEntry);
+    std::vector<Scene> custom = MakeCustomScenes();
+    std::move(custom.begin(), custom.end(), std::back_inserter(scenes));
+    std::stable_sort(scenes.begin(), scenes.end(),
+                     [](Scene const& a, Scene const& b) { return a.group < b.group; });
+    return scenes;
+}
+
+} // namespace
+
+std::vector<Scene> const& GetScenes() {
+    static std::vector<Scene> const kScenes = MakeScenes();
+    return kScenes;
+}
+
+} // namespace Moka::Scenes

@@ -1,0 +1,72 @@
+#include "scenes/SceneRenderer.h"
+
+#include "moka/base/RefPtr.h"
+#include "moka/graphics/bitmap/IMKBitmap.h"
+#include "moka/graphics/bitmap/IMKSubBitmap.h"
+#include "moka/graphics/bitmap/IMKTextureBitmap.h"
+#include "moka/graphics/bitmap/MKGraphicsFactory.h"
+#include "moka/graphics/canvas/IMKCanvas.h"
+#include "moka/graphics/task/IGLMsgQueue.h"
+#include "scenes/SceneError.h"
+
+#include <algorithm>
+#include <memory>
+#include <new>
+
+namespace Moka::Scenes {
+namespace {
+
+RefPtr<IMKBitmap> MakeTarget(Scene const& scene, IGLMsgQueue& queue) {
+    IMKBitmap* const target =
+        scene.onScreen
+            ? MKGraphicsFactory::CreateScreenBitmap(&queue, 0, 0, scene.width, scene.height, 1, 1)
+            : MKGraphicsFactory::CreateBitmap(&queue, scene.width, scene.height, nullptr, false, 1, false);
+    if (!target) throw SceneError(scene.name + ": there is no room for its picture");
+    return RefPtr<IMKBitmap>::Adopt(target);
+}
+
+// Strips are made on the render thread, which reports nothing: what has no texture now never gets one.
+void CheckStrips(Scene const& scene, IMKBitmap& target, IGLMsgQueue& queue) {
+    IMKTextureBitmap* const strips = target.GetTextureBitmap();
+    if (!strips) return;
+    queue.WaitForTasks();
+    for (int i = 0; i < strips->GetSubBitmapCount(); ++i) {
+        IMKSubBitmap* const strip = strips->GetSubBitmap(i);
+        if (!strip || !strip->GetTexture())
+            throw SceneError(scene.name + ": the GPU has no room for its picture");
+    }
+}
+
+// The screen is read bottom row first.
+void FlipRows(Picture& picture) {
+    for (int y = 0; y < picture.height / 2; ++y)
+        std::swap_ranges(picture.At(0, y), picture.At(0, y) + picture.GetStride(),
+                         picture.At(0, picture.height - 1 - y));
+}
+
+} // namespace
+
+IMKBitmap* QueueStage::MakeBitmap(Picture const& picture) {
+    std::unique_ptr<unsigned char[]> pixels(new (std::nothrow) unsigned char[picture.CountBytes()]);
+    if (!pixels) return nullptr;
+    std::copy(picture.pixels.begin(), picture.pixels.end(), pixels.get());
+    IMKBitmap* const bitmap =
+        MKGraphicsFactory::CreateBitmap(&mQueue, picture.width, picture.height, pixels.get(), true, 1, false);
+    if (bitmap) pixels.release();
+    return bitmap;
+}
+
+Picture RenderScene(Scene const& scene, IGLMsgQueue& queue) {
+    RefPtr<IMKBitmap> const target = MakeTarget(scene, queue);
+    CheckStrips(scene, *target, queue);
+    auto const canvas = RefPtr<IMKCanvas>::Adopt(MKGraphicsFactory::CreateCanvas(&queue, target.Get(), 1));
+    if (!canvas) throw SceneError(scene.name + ": there is no room for a canvas");
+    QueueStage stage(queue);
+    DrawScene(scene, *canvas, stage);
+    Picture picture(scene.width, scene.height);
+    target->GetBitmapData(target->GetBitmapRect(), picture.pixels.data());
+    if (scene.onScreen) FlipRows(picture);
+    return picture;
+}
+
+} // namespace Moka::Scenes

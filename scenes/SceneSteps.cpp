@@ -1,0 +1,145 @@
+#include "scenes/SceneSteps.h"
+
+#include "scenes/SceneError.h"
+
+#include <algorithm>
+#include <memory>
+#include <optional>
+
+namespace Moka::Scenes {
+namespace {
+
+using Kind = SceneValue::Kind;
+
+constexpr int kMaxRepeat = 100'000;
+
+void CheckCount(long long count, int line) {
+    if (count > kMaxOperations)
+        throw SceneLineError(line, "a scene may have " + std::to_string(kMaxOperations) +
+                                       " operations, repetitions and batches counted one by one");
+}
+
+// Moves, turns and scales what follows: the last comes first to a point, as with the canvas's Pre operations.
+struct Placement {
+    Placement() = default;
+    explicit Placement(SceneFields& fields) {
+        if (SceneValue const* const value = fields.Find("translate"))
+            translate = ReadPoint(*value, fields.Name("translate"));
+        if (SceneValue const* const value = fields.Find("rotate"))
+            rotate = ReadFloat(*value, fields.Name("rotate"));
+        if (SceneValue const* const value = fields.Find("scale"))
+            scale = ReadPoint(*value, fields.Name("scale"));
+    }
+
+    void Apply(IMKCanvas& canvas) const {
+        if (translate) canvas.PreTranslate(translate->x, translate->y);
+        if (rotate) canvas.PreRotate(*rotate);
+        if (scale) canvas.PreScale(scale->x, scale->y);
+    }
+
+    std::optional<PointF> translate;
+    std::optional<float> rotate;
+    std::optional<PointF> scale;
+};
+
+struct Group {
+    Placement placement;
+    std::optional<Matrix3f> matrix;
+    std::optional<Rect> clip;
+    int repeat = 1;
+    Placement advance; // from one repetition to the next
+    SceneSteps content;
+
+    void Play(IMKCanvas& canvas, SceneBitmaps const& bitmaps) const {
+        int const level = canvas.Save(IMKCanvasBase::SaveAll);
+        placement.Apply(canvas);
+        if (matrix) canvas.PreConcat(*matrix);
+        if (clip)
+            canvas.SetClipRect(clip->left, clip->top, clip->GetWidth(), clip->GetHeight(),
+                               IMKCanvasBase::Intersect);
+        for (int i = 0; i < repeat; ++i) PlayOnce(i, canvas, bitmaps);
+        canvas.Restore(level);
+    }
+
+private:
+    void PlayOnce(int index, IMKCanvas& canvas, SceneBitmaps const& bitmaps) const {
+        if (index > 0) advance.Apply(canvas);
+        if (repeat == 1) return content.Play(canvas, bitmaps);
+        int const level = canvas.Save(IMKCanvasBase::SaveAll);
+        content.Play(canvas, bitmaps);
+        canvas.Restore(level);
+    }
+};
+
+Rect ReadClip(SceneValue const& value, std::string const& what) {
+    std::vector<float> const n = ReadFloats(value, what, 4, "[x, y, width, height]");
+    auto const at = [&](std::size_t i) { return ReadInt(value.items[i], what, -1'000'000, 1'000'000); };
+    return {at(0), at(1), at(0) + at(2), at(1) + at(3)};
+}
+
+void ReadRepeat(SceneValue const& value, Group& group) {
+    SceneFields fields(value, "repeat");
+    group.repeat = ReadInt(fields.Get("count"), fields.Name("count"), 1, kMaxRepeat);
+    group.advance = Placement(fields);
+    fields.CheckAll();
+}
+
+SceneOperation ReadGroup(SceneFields& fields, SceneNames const& names) {
+    auto const group = std::make_shared<Group>();
+    group->placement = Placement(fields);
+    if (SceneValue const* const value = fields.Find("matrix"))
+        group->matrix = ReadMatrix(*value, fields.Name("matrix"));
+    if (SceneValue const* const value = fields.Find("clip"))
+        group->clip = ReadClip(*value, fields.Name("clip"));
+    if (SceneValue const* const value = fields.Find("repeat")) ReadRepeat(*value, *group);
+    group->content = ReadSteps(fields.Get("operations"), fields.Name("operations"), names);
+    return {[group](IMKCanvas& canvas, SceneBitmaps const& bitmaps) { group->Play(canvas, bitmaps); },
+            // What is empty takes time, too, when it is repeated.
+            std::max(1LL, group->content.count) * group->repeat};
+}
+
+SceneOperationReader FindReader(std::string const& name) {
+    if (name == "Group") return ReadGroup;
+    for (SceneOperationTable const* const table : {&GetDrawingOperations(), &GetStateOperations()}) {
+        auto const found = table->find(name);
+        if (found != table->end()) return found->second;
+    }
+    return nullptr;
+}
+
+std::string ListOperations() {
+    std::string names = "Group";
+    for (SceneOperationTable const* const table : {&GetDrawingOperations(), &GetStateOperations()})
+        for (auto const& entry : *table) names += ", " + entry.first;
+    return names;
+}
+
+SceneOperation ReadOperation(SceneValue const& value, SceneNames const& names) {
+    if (value.kind != Kind::Object || value.keys.size() != 1)
+        ThrowExpected(value, "an operation", "an object with one name, as {\"DrawCircle\": { ... }}");
+    std::string const& name = value.keys.front();
+    SceneOperationReader const reader = FindReader(name);
+    if (!reader)
+        throw SceneLineError(value.items.front().line,
+                             "there is no operation \"" + name + "\"; there are " + ListOperations());
+    SceneFields fields(value.items.front(), name);
+    SceneOperation operation = reader(fields, names);
+    fields.CheckAll();
+    return operation;
+}
+
+} // namespace
+
+SceneSteps ReadSteps(SceneValue const& value, std::string const& what, SceneNames const& names) {
+    if (value.kind != Kind::List) ThrowExpected(value, what, "a list of operations");
+    SceneSteps result;
+    for (SceneValue const& item : value.items) {
+        SceneOperation operation = ReadOperation(item, names);
+        result.count += std::max(1LL, operation.count);
+        CheckCount(result.count, item.line);
+        result.steps.push_back(std::move(operation.step));
+    }
+    return result;
+}
+
+} // namespace Moka::Scenes

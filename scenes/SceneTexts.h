@@ -1,0 +1,16 @@
+// SceneTexts.h: the files of scenes/data, which the build puts into the library.
+#pragma once
+
+#include <cstddef>
+
+namespace Moka::Scenes {
+
+struct SceneText {
+    char const* name;
+    char const* text;
+};
+
+extern SceneText const kSceneTexts[];
+extern std::size_t const kSceneTextCount;
+
+} // namespace Moka::Scenes
