@@ -1,0 +1,160 @@
+#include "tests/pixel/canvas/CanvasDrawing.h"
+
+#include "moka/base/log/AndroidLog.h"
+#include "moka/graphics/bitmap/MKGraphicsFactory.h"
+#include "moka/renderer/RendererFactory.h"
+
+#include <cstring>
+#include <memory>
+
+namespace Moka::Testing {
+namespace {
+
+using BitmapPtr = RefPtr<IMKBitmap>;
+using CanvasPtr = RefPtr<IMKCanvas>;
+
+class Renderer : public ::testing::Environment {
+public:
+    RenderThread* Use(int side) {
+        if (mThread && mSide == side) return mThread.get();
+        mThread.reset();
+        RenderThreadOptions options;
+        options.limits.maxTextureSize = side;
+        options.debugContext = true;
+        std::string error;
+        mThread = RenderThread::Start(options, &error);
+        mSide = side;
+        EXPECT_TRUE(mThread) << error;
+        return mThread.get();
+    }
+    void Stop() { mThread.reset(); }
+    void TearDown() override { Stop(); }
+
+private:
+    std::unique_ptr<RenderThread> mThread;
+    int mSide = 0;
+};
+
+// The framework owns it, and stops the thread before the process ends.
+Renderer& GetRenderer() {
+    static auto* const renderer = static_cast<Renderer*>(::testing::AddGlobalTestEnvironment(new Renderer));
+    return *renderer;
+}
+
+// So that the framework knows of it before the first test.
+[[maybe_unused]] Renderer& gRenderer = GetRenderer();
+
+class GpuStage final : public Scenes::SceneStage {
+public:
+    GpuStage(IGLMsgQueue& queue, bool onRenderThread) : mQueue(queue), mUseQueue(onRenderThread ? 0 : 1) {}
+
+    IMKBitmap* MakeBitmap(Scenes::Picture const& picture) override {
+        auto* const copy = new unsigned char[picture.CountBytes()];
+        std::memcpy(copy, picture.pixels.data(), picture.CountBytes());
+        return MKGraphicsFactory::CreateBitmap(&mQueue, picture.width, picture.height, copy, true, mUseQueue,
+                                               false);
+    }
+    IGLMsgQueue* GetQueue() override { return &mQueue; }
+
+private:
+    IGLMsgQueue& mQueue;
+    int const mUseQueue;
+};
+
+class ReferenceStage final : public Scenes::SceneStage {
+public:
+    IMKBitmap* MakeBitmap(Scenes::Picture const& picture) override {
+        TestImage image(picture.width, picture.height);
+        image.pixels = picture.pixels;
+        return new ReferenceBitmap(image);
+    }
+    IGLMsgQueue* GetQueue() override { return nullptr; }
+};
+
+TestImage DrawOnGpu(Drawing const& drawing, IGLMsgQueue& queue, bool onRenderThread) {
+    TestImage const& start = drawing.start;
+    int const useQueue = onRenderThread ? 0 : 1;
+    auto const bitmap = BitmapPtr::Adopt(MKGraphicsFactory::CreateBitmap(
+        &queue, start.width, start.height, start.pixels.data(), false, useQueue, false));
+    TestImage picture(start.width, start.height);
+    if (!bitmap) return picture;
+    {
+        auto const canvas = CanvasPtr::Adopt(MKGraphicsFactory::CreateCanvas(&queue, bitmap.Get(), useQueue));
+        GpuStage stage(queue, onRenderThread);
+        drawing.draw(*canvas, stage);
+    }
+    bitmap->GetBitmapData(bitmap->GetBitmapRect(), picture.pixels.data());
+    return picture;
+}
+
+} // namespace
+
+TestImage MakeBackdrop(int width, int height) {
+    TestImage const pattern = MakeAlphaPattern(16, 16);
+    TestImage image(width, height);
+    for (int y = 0; y < height; ++y) {
+        for (int x = 0; x < width; ++x) image.SetColor(x, y, pattern.GetColor(y % 16, x % 16));
+    }
+    return image;
+}
+
+void CanvasDrawing::UseLargestSide(int side) { mSide = side; }
+
+RenderThread& CanvasDrawing::GetRenderThread() const { return *GetRenderer().Use(mSide); }
+
+void CanvasDrawing::TearDown() {
+    GetRenderThread().WaitForTasks();
+    RendererStatistics const s = RendererFactory::GetStatistics();
+    EXPECT_LE(s.textures + s.frameBuffers + s.renderBuffers, kept);
+    EXPECT_EQ(s.textureObjects + s.renderTargets + s.depthStencilBuffers, 0);
+    EXPECT_EQ(s.programs + s.graphicsObjects + s.stateObjects, 0);
+    EXPECT_EQ(s.errors, 0u);
+    for (std::string const& line : log.GetTexts(ANDROID_LOG_ERROR)) ADD_FAILURE() << line;
+    if (kept > 0) GetRenderer().Stop();
+}
+
+TestImage CanvasDrawing::Draw(Drawing const& drawing, Way way) {
+    RenderThread& thread = GetRenderThread();
+    TestImage picture(0, 0);
+    if (way == Way::Immediate) thread.Call([] { RendererFactory::SetDeferred(false); });
+    if (way == Way::RenderThread) {
+        thread.Call([&] { picture = DrawOnGpu(drawing, thread, true); });
+    } else {
+        picture = DrawOnGpu(drawing, thread, false);
+    }
+    if (way == Way::Immediate) thread.Call([] { RendererFactory::SetDeferred(true); });
+    return picture;
+}
+
+ReferencePicture CanvasDrawing::DrawReference(Drawing const& drawing, int maxSide) const {
+    ReferenceCanvas::Device device{maxSide};
+    // The least that OpenGL ES allows.
+    if (GetRenderThread().GetContextInfo().renderer.find("SwiftShader") != std::string::npos)
+        device.subpixelBits = 4;
+    auto const bitmap = RefPtr<ReferenceBitmap>::Adopt(new ReferenceBitmap(drawing.start));
+    auto const canvas = RefPtr<ReferenceCanvas>::Adopt(new ReferenceCanvas(*bitmap, device));
+    ReferenceStage stage;
+    drawing.draw(*canvas, stage);
+    return {bitmap->image, canvas->GetSlack()};
+}
+
+void CanvasDrawing::ExpectLikeReference(Drawing const& drawing, std::string const& what, Way way) {
+    ExpectLike(DrawReference(drawing, mSide), Draw(drawing, way), what);
+}
+
+void CanvasDrawing::ExpectLike(ReferencePicture const& reference, TestImage const& actual,
+                               std::string const& what) {
+    int const open = reference.slack.CountOver(kCoarse);
+    EXPECT_LE(open * 7, actual.width * actual.height) << what << ": the reference knows too little";
+    RecordProperty("open", open);
+    ExpectSame(reference.image, actual, what, &reference.slack);
+}
+
+void CanvasDrawing::ExpectSame(TestImage const& expected, TestImage const& actual, std::string const& what,
+                               Slack const* slack) {
+    ImageDifference const difference = CompareImages(expected, actual, slack);
+    if (difference.differingPixels == 0) return;
+    ADD_FAILURE() << what << ": " << difference << "; " << KeepDifference(expected, actual, what, slack);
+}
+
+} // namespace Moka::Testing

@@ -1,0 +1,72 @@
+// CanvasDrawing: draws the same thing with the real canvas, in each of its ways, and with the reference, and
+// compares the pictures.
+#pragma once
+
+#include "moka/base/RefPtr.h"
+#include "moka/host/RenderThread.h"
+#include "scenes/Picture.h"
+#include "scenes/SceneStage.h"
+#include "tests/support/LogCapture.h"
+#include "tests/support/reference/ReferenceCanvas.h"
+
+#include <gtest/gtest.h>
+
+#include <functional>
+#include <string>
+
+namespace Moka::Testing {
+
+// What is drawn over a picture that is there from the start.
+struct Drawing {
+    using Function = std::function<void(IMKCanvas&, Scenes::SceneStage&)>;
+
+    TestImage start;
+    Function draw;
+};
+
+enum class Way {
+    Deferred,    // a caller-side canvas; the renderer plays its list when the queue is empty
+    Immediate,   // a caller-side canvas; the renderer plays every draw
+    RenderThread // a render-thread canvas, drawn on there
+};
+
+// What the reference drew, and how far off each pixel may be.
+struct ReferencePicture {
+    TestImage image;
+    Slack slack;
+};
+
+// Every alpha, with colours of its own, so that every blend shows.
+TestImage MakeBackdrop(int width, int height);
+
+class CanvasDrawing : public ::testing::Test {
+protected:
+    static constexpr int kLarge = 4096;
+    static constexpr int kCoarse = 16;
+
+    // The render thread stays from test to test, and only another side begins a new one.
+    void UseLargestSide(int side);
+    RenderThread& GetRenderThread() const;
+
+    // Nothing alive on the GPU, no driver message, no error line.
+    void TearDown() override;
+
+    TestImage Draw(Drawing const& drawing, Way way = Way::Deferred);
+
+    ReferencePicture DrawReference(Drawing const& drawing, int maxSide) const;
+
+    // As near as the reference allows, which may leave more than kCoarse open in a seventh of the picture.
+    void ExpectLikeReference(Drawing const& drawing, std::string const& what, Way way = Way::Deferred);
+    void ExpectLike(ReferencePicture const& reference, TestImage const& actual, std::string const& what);
+    static void ExpectSame(TestImage const& expected, TestImage const& actual, std::string const& what,
+                           Slack const* slack = nullptr);
+
+    LogCapture log;
+    // What the renderer may keep for the next time: after a target was drawn onto itself its copy.
+    int kept = 0;
+
+private:
+    int mSide = kLarge;
+};
+
+} // namespace Moka::Testing

@@ -1,0 +1,100 @@
+#include "tests/support/reference/ClipSet.h"
+
+#include <algorithm>
+
+namespace Moka::Testing {
+namespace {
+
+bool IsReplace(ClipEntry const& e) { return e.op == IMKCanvasBase::Replace; }
+bool CutsStraight(ClipEntry const& e) { return e.matrix[3] == 0.0f; }
+
+bool ArePixelsEnough(std::vector<ClipEntry> const& entries) {
+    if (entries.size() == 1 && CutsStraight(entries[0])) return true;
+    if (IsReplace(entries.back()) && CutsStraight(entries.back())) return true;
+    return std::all_of(entries.begin(), entries.end(), [](ClipEntry const& e) {
+        return CutsStraight(e) && (e.op == IMKCanvasBase::Intersect || IsReplace(e));
+    });
+}
+
+int Truncated(float v) { return static_cast<int>(v); }
+
+// The bottom edge is cut off from below, where the last row of the target is 0.
+Rect ToPixels(ClipEntry const& e, int targetHeight) {
+    Matrix3f const& m = e.matrix;
+    int const left = Truncated(m[0] * static_cast<float>(e.x) + m[6]);
+    int const width = Truncated(m[0] * static_cast<float>(e.width));
+    int const height = Truncated(m[4] * static_cast<float>(e.height));
+    int const above = Truncated(static_cast<float>(targetHeight) -
+                                (m[4] * static_cast<float>(e.y) + m[7] + static_cast<float>(height)));
+    int const bottom = targetHeight - above;
+    return {left, bottom - height, left + width, bottom};
+}
+
+bool Combine(IMKCanvasBase::ClipOp op, bool area, bool rect) {
+    switch (op) {
+    case IMKCanvasBase::Intersect:
+        return area && rect;
+    case IMKCanvasBase::Replace:
+        return rect;
+    case IMKCanvasBase::Union:
+        return area || rect;
+    case IMKCanvasBase::Xor:
+        return area != rect;
+    case IMKCanvasBase::Difference:
+        return area && !rect;
+    case IMKCanvasBase::ReverseDifference:
+        return rect && !area;
+    }
+    return area;
+}
+
+bool HoldsPoint(RectF const& r, PointD const& p) {
+    return p.x >= static_cast<double>(r.left) && p.x < static_cast<double>(r.right) &&
+           p.y >= static_cast<double>(r.top) && p.y < static_cast<double>(r.bottom);
+}
+
+} // namespace
+
+ClipSet::ClipSet(std::vector<ClipEntry> const& entries, int targetHeight) {
+    if (entries.empty()) return;
+    auto const last = std::find_if(entries.rbegin(), entries.rend(), IsReplace);
+    mStartsFull = last == entries.rend();
+    std::size_t const from = mStartsFull ? 0 : static_cast<std::size_t>(entries.rend() - last) - 1;
+    if (ArePixelsEnough(entries)) {
+        mKind = Kind::Pixels;
+        CutPixels(entries, from, targetHeight);
+        return;
+    }
+    mKind = Kind::Points;
+    for (std::size_t i = from; i < entries.size(); ++i) {
+        ClipEntry const& e = entries[i];
+        auto const x = static_cast<float>(e.x);
+        auto const y = static_cast<float>(e.y);
+        RectF const r(
+            std::min(x, x + static_cast<float>(e.width)), std::min(y, y + static_cast<float>(e.height)),
+            std::max(x, x + static_cast<float>(e.width)), std::max(y, y + static_cast<float>(e.height)));
+        mRegions.push_back({e.op, r, Transform(e.matrix)});
+    }
+}
+
+void ClipSet::CutPixels(std::vector<ClipEntry> const& entries, std::size_t from, int targetHeight) {
+    mPixels = ToPixels(entries[from], targetHeight);
+    for (std::size_t i = from + 1; i < entries.size(); ++i) {
+        Rect const r = ToPixels(entries[i], targetHeight);
+        mPixels = Rect(std::max(mPixels.left, r.left), std::max(mPixels.top, r.top),
+                       std::min(mPixels.right, r.right), std::min(mPixels.bottom, r.bottom));
+    }
+}
+
+bool ClipSet::Contains(int pixelX, int pixelY, PointD const& point) const {
+    if (mKind == Kind::Everything) return true;
+    if (mKind == Kind::Pixels) return mPixels.Contains(Point(pixelX, pixelY));
+    bool area = mStartsFull;
+    for (Region const& region : mRegions) {
+        auto const local = region.transform.Unmap(point);
+        area = Combine(region.op, area, local && HoldsPoint(region.rect, *local));
+    }
+    return area;
+}
+
+} // namespace Moka::Testing

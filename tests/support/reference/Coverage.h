@@ -1,0 +1,53 @@
+// Coverage.h: how much of a point's surroundings a shape covers, from the shape's geometry: distances to
+// edges and ramps one unit wide across them, in the units the shape is given in.
+#pragma once
+
+#include "moka/base/Rect.h"
+#include "tests/support/reference/Plane.h"
+
+#include <array>
+#include <functional>
+#include <optional>
+
+namespace Moka::Testing {
+
+struct Fragment {
+    double coverage = 0;
+    // Parts of the shape lie over each other here in a way that its definition leaves open.
+    bool vague = false;
+};
+// Nothing where the shape makes no fragment; that differs from coverage 0 when a mode replaces.
+using Coverage = std::optional<Fragment>;
+
+using Blur = std::array<PointD, 2>;
+
+struct Shape {
+    RectF bounds; // outside there are no fragments
+    std::function<Coverage(PointD const&)> at;
+    // How far off in two directions a point may be found by a program that measures in medium precision, of
+    // which ten binary digits are all that can be relied on. Null when nothing is measured so.
+    std::function<Blur(PointD const&)> blur{};
+};
+
+// What ten binary digits leave open of a number of size 1.
+constexpr double kMediumPrecision = 1.0 / 1024;
+// What a number loses when it is stored in them.
+double GetMediumError(double v);
+
+// The distance to the nearest edge, positive inside. Corners are mitred: it is the minimum, so that equal
+// distances form nested rectangles.
+double InsetIn(RectF const& r, PointD const& p);
+RectF Grown(RectF const& r, double by);
+RectF Sorted(RectF const& r);
+
+Shape FilledRect(RectF const& r, bool antiAliased);
+Shape StrokedRect(RectF const& r, double width, bool antiAliased);
+
+// Always anti-aliased.
+Shape FilledCircle(PointD const& center, double radius);
+Shape StrokedCircle(PointD const& center, double radius, double width);
+
+// Soft along the sides, cut at the ends.
+Shape SimpleLine(PointD const& from, PointD const& to, double width, bool antiAliased);
+
+} // namespace Moka::Testing
