@@ -24,13 +24,6 @@ int SaturatedInt(float whole) {
     return static_cast<int>(whole);
 }
 
-bool OverlapsOnAxis(float lowA, float highA, float lowB, float highB) {
-    if (std::isunordered(lowA, highA) || std::isunordered(lowB, highB)) return false;
-    float const low = std::max(lowA, lowB);
-    float const high = std::min(highA, highB);
-    return low < high || (low == high && (lowA == highA || lowB == highB));
-}
-
 } // namespace
 
 Rect::Rect(RectF const& r)
@@ -57,31 +50,6 @@ Rect Rect::Intersect(Rect const& other) const {
     return shared.IsEmpty() ? Rect() : shared;
 }
 
-RectF::RectF(Rect const& r)
-    : left(static_cast<float>(r.left)),
-      top(static_cast<float>(r.top)),
-      right(static_cast<float>(r.right)),
-      bottom(static_cast<float>(r.bottom)) {}
-
-void RectF::Set(float l, float t, float r, float b) { *this = RectF(l, t, r, b); }
-
-// Negated so that NaN counts as empty.
-bool RectF::IsEmpty() const { return !(left < right && top < bottom); }
-
-void RectF::MakeRect(float x, float y) {
-    if (x < left) left = x;
-    if (x > right) right = x;
-    if (y < top) top = y;
-    if (y > bottom) bottom = y;
-}
-
 void RectF::ExtendRect() { Set(std::floor(left), std::floor(top), std::ceil(right), std::ceil(bottom)); }
-
-void RectF::IncreaseRect(float dx, float dy) { Set(left - dx, top - dy, right + dx, bottom + dy); }
-
-bool RectF::IsIntersect(RectF const& other) const {
-    return OverlapsOnAxis(left, right, other.left, other.right) &&
-           OverlapsOnAxis(top, bottom, other.top, other.bottom);
-}
 
 } // namespace Moka

@@ -5,6 +5,9 @@
 #include "moka/base/Export.h"
 #include "moka/base/Point.h"
 
+#include <algorithm>
+#include <cmath>
+
 namespace Moka {
 
 class RectF;
@@ -50,33 +53,54 @@ public:
 
     constexpr RectF() = default;
     constexpr RectF(float l, float t, float r, float b) : left(l), top(t), right(r), bottom(b) {}
-    explicit RectF(Rect const& r);
+    explicit RectF(Rect const& r)
+        : left(static_cast<float>(r.left)),
+          top(static_cast<float>(r.top)),
+          right(static_cast<float>(r.right)),
+          bottom(static_cast<float>(r.bottom)) {}
 
-    void Set(float l, float t, float r, float b);
+    void Set(float l, float t, float r, float b) { *this = RectF(l, t, r, b); }
 
     float GetWidth() const { return right - left; }
     float GetHeight() const { return bottom - top; }
-    bool IsEmpty() const; // width or height is not positive, or not a number
+    // Width or height is not positive, or not a number.
+    bool IsEmpty() const { return !(left < right && top < bottom); }
 
     // Grows the rectangle so that it contains (x, y); start from a degenerate rectangle at the first point.
     // A coordinate that is NaN changes nothing.
-    void MakeRect(float x, float y);
+    void MakeRect(float x, float y) {
+        if (x < left) left = x;
+        if (x > right) right = x;
+        if (y < top) top = y;
+        if (y > bottom) bottom = y;
+    }
 
     // Rounds outwards to whole numbers: left and top down, right and bottom up.
     void ExtendRect();
 
     // Moves every edge outwards by the given distances (inwards when negative).
-    void IncreaseRect(float dx, float dy);
+    void IncreaseRect(float dx, float dy) { Set(left - dx, top - dy, right + dx, bottom + dy); }
 
     // Per axis, with lo the greater of the low edges and hi the lesser of the high ones: overlap when lo <
     // hi, or when lo == hi and one of the two has no extent on that axis. So horizontal and vertical lines
     // count, a full rectangle that ends exactly on the other's edge does not. NaN never intersects.
-    bool IsIntersect(RectF const& other) const;
+    bool IsIntersect(RectF const& other) const {
+        return OverlapsOnAxis(left, right, other.left, other.right) &&
+               OverlapsOnAxis(top, bottom, other.top, other.bottom);
+    }
 
     friend constexpr bool operator==(RectF const& a, RectF const& b) {
         return a.left == b.left && a.top == b.top && a.right == b.right && a.bottom == b.bottom;
     }
     friend constexpr bool operator!=(RectF const& a, RectF const& b) { return !(a == b); }
+
+private:
+    static bool OverlapsOnAxis(float lowA, float highA, float lowB, float highB) {
+        if (std::isunordered(lowA, highA) || std::isunordered(lowB, highB)) return false;
+        float const low = std::max(lowA, lowB);
+        float const high = std::min(highA, highB);
+        return low < high || (low == high && (lowA == highA || lowB == highB));
+    }
 };
 
 } // namespace Moka

@@ -20,13 +20,11 @@ ITextureObject* MakeTexture(TextureDescriptor const& descriptor, PixelSource con
                                                 static_cast<int>(std::size(kInitialParameters)), source);
 }
 
-} // namespace
-
-Matrix4<float> MKSubBitmapBase::GetProjectionMatrix() {
-    float const l = static_cast<float>(mRect.left);
-    float const r = static_cast<float>(mRect.right);
-    float const t = static_cast<float>(mRect.top);
-    float const b = static_cast<float>(mRect.bottom);
+Matrix4<float> Project(Rect const& rect) {
+    float const l = static_cast<float>(rect.left);
+    float const r = static_cast<float>(rect.right);
+    float const t = static_cast<float>(rect.top);
+    float const b = static_cast<float>(rect.bottom);
     Matrix4<float> m(0.0f);
     m[0] = 2.0f / (r - l);
     m[5] = 2.0f / (b - t);
@@ -37,6 +35,11 @@ Matrix4<float> MKSubBitmapBase::GetProjectionMatrix() {
     m[15] = 1.0f;
     return m;
 }
+
+} // namespace
+
+MKSubBitmapBase::MKSubBitmapBase(IGLMsgQueue* queue, int index, Rect const& rect)
+    : mMsgQueue(queue), mIndex(index), mRect(rect), mProjection(Project(rect)) {}
 
 void MKSubBitmapBase::CreateTexture(int x, int y, int rowLength, void const* pixels, bool textureFlag) {
     if (mTexture) return;

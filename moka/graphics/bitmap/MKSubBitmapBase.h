@@ -32,7 +32,7 @@ public:
 
     // From the strip's own rectangle; the depth range is -32767 ... 32767. Row `top` maps to -1, which keeps
     // texture row 0 at the first row of the frame buffer.
-    Matrix4<float> GetProjectionMatrix() override;
+    Matrix4<float> GetProjectionMatrix() override { return mProjection; }
 
     void CreateFrameBufferRT(bool release) override;
     void ReleaseFrameBufferRT(bool release) override;
@@ -50,8 +50,7 @@ public:
     void SetTextureWrapRT(TextureParamWrapping kind, TextureParamWrappingValue value, bool release) override;
 
 protected:
-    MKSubBitmapBase(IGLMsgQueue* queue, int index, Rect const& rect)
-        : mMsgQueue(queue), mIndex(index), mRect(rect) {}
+    MKSubBitmapBase(IGLMsgQueue* queue, int index, Rect const& rect);
 
     // The first texture wins; later calls, and a null model, do nothing.
     void CreateTexture(int x, int y, int rowLength, void const* pixels, bool textureFlag);
@@ -75,6 +74,7 @@ protected:
     IGLMsgQueue* const mMsgQueue; // not owned
     int const mIndex;
     Rect const mRect;
+    Matrix4<float> const mProjection; // asked for by every draw
     // Atomic because they are looked at from caller threads, which may see them a moment late.
     std::atomic<ITextureObject*> mTexture{nullptr};
     std::atomic<MKFrameBuffer*> mFrameBuffer{nullptr};

@@ -12,7 +12,8 @@ DrawState::DrawState()
       mDepthStencil(RendererFactory::CreateDepthStencilState(DepthStencilStateDescriptor(false, false))) {}
 
 void DrawState::ApplyBlend(MKPaint::XFermode mode) {
-    mBlend->SetDescriptor(MKGraphicsUtil::GetBlendingStateDescriptor(mode));
+    if (mode != mMode) mBlend->SetDescriptor(MKGraphicsUtil::GetBlendingStateDescriptor(mode));
+    mMode = mode;
     mBlend->Apply();
 }
 

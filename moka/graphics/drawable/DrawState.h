@@ -8,6 +8,8 @@
 #include "moka/renderer/IBlendStateObject.h"
 #include "moka/renderer/IDepthStencilState.h"
 
+#include <optional>
+
 namespace Moka::detail {
 
 class DrawState {
@@ -29,6 +31,7 @@ public:
 private:
     RendererPtr<IBlendStateObject> mBlend;
     RendererPtr<IDepthStencilState> mDepthStencil;
+    std::optional<MKPaint::XFermode> mMode; // that the blend state has
 };
 
 } // namespace Moka::detail

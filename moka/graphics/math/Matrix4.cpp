@@ -156,15 +156,18 @@ Matrix4<T> Matrix4<T>::rotateMatrix(Vector3<T> dir, Vector3<T> up) {
     return {n.x, n.y, n.z, 0, u.x, u.y, u.z, 0, d.x, d.y, d.z, 0, 0, 0, 0, 1};
 }
 
+// A whole column at a time, which compilers turn into vector instructions; each element is summed from the
+// first term to the last.
 template <class T>
 Matrix4<T> Matrix4<T>::operator*(Matrix4 const& right) const {
-    Matrix4 const& left = *this;
+    T const* const l = mElements;
     Matrix4 result;
     for (int column = 0; column < 4; ++column) {
-        for (int row = 0; row < 4; ++row) {
-            result(row, column) = left(row, 0) * right(0, column) + left(row, 1) * right(1, column) +
-                                  left(row, 2) * right(2, column) + left(row, 3) * right(3, column);
-        }
+        T const* const r = right.mElements + 4 * column;
+        T sums[4];
+        for (int row = 0; row < 4; ++row)
+            sums[row] = l[row] * r[0] + l[4 + row] * r[1] + l[8 + row] * r[2] + l[12 + row] * r[3];
+        std::copy_n(sums, 4, result.mElements + 4 * column);
     }
     return result;
 }

@@ -1,6 +1,5 @@
 #include "moka/renderer/gles/GlContext.h"
 
-#include "moka/base/Check.h"
 #include "moka/renderer/gles/GlFrameBuffer.h"
 #include "moka/renderer/gles/GlPlayer.h"
 #include "moka/renderer/gles/GlRenderTarget.h"
@@ -70,17 +69,14 @@ void GlContext::ClearIdleSamplers() {
     if (statistics.textureObjects == 0 && list.IsEmpty()) samplers.Clear();
 }
 
-bool GlContext::Enter() {
-    if (!mAttached) return false;
-    MOKA_CHECK(IsRenderThread(), "the renderer is used on the thread that attached it");
-    if (targets.IsHostsTurn()) current.Forget();
-    if (targets.IsHostsTurn() || mIsForeign) state.Invalidate();
-    if (mHasOrphans) DeleteOrphans();
-    return true;
+// The host, or foreign code between a commit and the invalidation, may have changed it.
+void GlContext::ForgetState() {
+    if (!mIsForeign) current.Forget();
+    state.Invalidate();
 }
 
-void GlContext::Leave() {
-    if (!IsThrough()) return;
+// Foreign code, or the host, finds what it expects.
+void GlContext::Settle() {
     if (targets.GetActive()) {
         BindActive();
     } else if (!targets.IsDeferred()) {
@@ -89,7 +85,7 @@ void GlContext::Leave() {
 }
 
 void GlContext::BindActive() {
-    GlTargetUse const use = targets.GetActive()->GetUse();
+    GlTargetUse const& use = targets.GetActive()->GetUse();
     targets.BindTarget(use);
     depthStencilPool.Attach(use);
 }
@@ -99,17 +95,20 @@ bool GlContext::Draw(GlVertices const& vertices) {
     if (!program || !program->CanDraw()) return false;
     if (vertices.count <= 0) return true;
     ++statistics.drawRequests;
-    GlDrawState& drawState = current.Resolve(GetDrawTarget(), vertices.format, vertices.primitive);
+    GlRenderTarget const* const active = targets.GetActive();
+    GlTargetUse hosts;
+    if (!active) hosts = PrepareHosts();
+    GlDrawState& drawState =
+        current.Resolve(active ? active->GetUse() : hosts, vertices.format, vertices.primitive);
     CopySampledTarget(drawState);
     list.AddDraw(drawState, !current.IsChanged(), vertices.data, vertices.count, vertices.floatsPerVertex);
     current.SetUnchanged();
     // A draw into the host's frame buffer uses the host's viewport, which the next activation takes away.
-    if (!targets.GetActive() || mIsForeign || list.IsFull()) Play();
+    if (!active || mIsForeign || list.IsFull()) Play();
     return true;
 }
 
-GlTargetUse GlContext::GetDrawTarget() {
-    if (GlRenderTarget const* const active = targets.GetActive()) return active->GetUse();
+GlTargetUse GlContext::PrepareHosts() {
     Play();
     targets.GiveBack();
     GlTargetUse hosts;

@@ -4,6 +4,7 @@
 // Thread:  the render thread, except where a line says otherwise.
 #pragma once
 
+#include "moka/base/Check.h"
 #include "moka/renderer/gles/GlCurrent.h"
 #include "moka/renderer/gles/GlDebug.h"
 #include "moka/renderer/gles/GlDepthStencilPool.h"
@@ -58,8 +59,16 @@ public:
     void DropTextureObject();
 
     // What GlOperation does. False: the context is detached, GL must not be called.
-    bool Enter();
-    void Leave();
+    bool Enter() {
+        if (!mAttached) return false;
+        MOKA_CHECK(IsRenderThread(), "the renderer is used on the thread that attached it");
+        if (targets.IsHostsTurn() || mIsForeign) ForgetState();
+        if (mHasOrphans) DeleteOrphans();
+        return true;
+    }
+    void Leave() {
+        if (IsThrough()) Settle();
+    }
 
     // Within an operation: adds a draw to the list. False when nothing can be drawn.
     bool Draw(GlVertices const& vertices);
@@ -106,8 +115,10 @@ private:
     void Delete(Orphan const& orphan);
     void DeleteOrphans();
     void ClearIdleSamplers();
+    void ForgetState();
+    void Settle();
     void BindActive();
-    GlTargetUse GetDrawTarget();
+    GlTargetUse PrepareHosts();
     void CopySampledTarget(GlDrawState& drawState);
 
     std::thread::id const mRenderThread = std::this_thread::get_id();

@@ -12,19 +12,15 @@ namespace Moka::detail {
 
 GlRenderTarget::GlRenderTarget(std::shared_ptr<GlContext> context, std::shared_ptr<GlFrameBuffer> frameBuffer,
                                int width, int height)
-    : mContext(std::move(context)), mFrameBuffer(std::move(frameBuffer)), mWidth(width), mHeight(height) {
+    : mContext(std::move(context)), mUse{std::move(frameBuffer), width, height, 0} {
     ++mContext->statistics.renderTargets;
 }
 
 GlRenderTarget::~GlRenderTarget() { --mContext->statistics.renderTargets; }
 
-GLuint GlRenderTarget::GetName() const { return mFrameBuffer->GetName(); }
+GLuint GlRenderTarget::GetName() const { return mUse.frameBuffer->GetName(); }
 
-GlTextureStorage* GlRenderTarget::GetStorage() const { return mFrameBuffer->GetStorage(); }
-
-GlTargetUse GlRenderTarget::GetUse() const {
-    return {mFrameBuffer, mWidth, mHeight, mDepthStencil ? mDepthStencil->GetName() : 0};
-}
+GlTextureStorage* GlRenderTarget::GetStorage() const { return mUse.frameBuffer->GetStorage(); }
 
 void GlRenderTarget::Activate() {
     GlOperation const operation(*mContext);
@@ -51,7 +47,7 @@ void GlRenderTarget::ReadPixels(int x, int y, int width, int height, PixelDestin
                             width, rowLength, destination.skipRows, destination.skipPixels);
         return;
     }
-    GlBlock block = GlBlock::Clip(x, y, width, height, mWidth, mHeight);
+    GlBlock block = GlBlock::Clip(x, y, width, height, GetWidth(), GetHeight());
     if (block.width == 0) return;
     block.skippedRows += destination.skipRows;
     block.skippedPixels += destination.skipPixels;
@@ -98,18 +94,19 @@ void GlRenderTarget::AttachDepthStencil(IDepthStencilBuffer* buffer) {
     if (!wanted) return;
     if (GlRenderTarget* const other = wanted->GetTarget()) other->Detach();
     mDepthStencil = wanted;
+    mUse.depthStencil = wanted->GetName();
     wanted->SetTarget(this);
 }
 
 bool GlRenderTarget::MayAttach(GlDepthStencil const& buffer) const {
-    bool const fits = buffer.GetWidth() == mWidth && buffer.GetHeight() == mHeight;
+    bool const fits = buffer.GetWidth() == GetWidth() && buffer.GetHeight() == GetHeight();
     bool const sameContext = buffer.GetContext() == mContext;
     if (GetStorage() && fits && sameContext) return true;
     __android_log_print(ANDROID_LOG_ERROR, "mok_log",
                         "a depth-stencil buffer of %d x %d cannot be attached to a %s of %d x %d%s",
                         buffer.GetWidth(), buffer.GetHeight(),
-                        GetStorage() ? "render target" : "frame buffer of the host's", mWidth, mHeight,
-                        sameContext ? "" : " of another context");
+                        GetStorage() ? "render target" : "frame buffer of the host's", GetWidth(),
+                        GetHeight(), sameContext ? "" : " of another context");
     return false;
 }
 
@@ -122,6 +119,7 @@ void GlRenderTarget::Detach() {
     if (!mDepthStencil) return;
     mDepthStencil->SetTarget(nullptr);
     mDepthStencil = nullptr;
+    mUse.depthStencil = 0;
 }
 
 void GlRenderTarget::ClearDepthStencil(bool clearDepth, float depth, bool clearStencil, int stencil) {

@@ -29,13 +29,13 @@ public:
     void ClearDepthStencil(bool clearDepth, float depth, bool clearStencil, int stencil) override;
 
     GLuint GetName() const;
-    int GetWidth() const { return mWidth; }
-    int GetHeight() const { return mHeight; }
+    int GetWidth() const { return mUse.width; }
+    int GetHeight() const { return mUse.height; }
     // Null for a host's frame buffer.
     GlTextureStorage* GetStorage() const;
     // As a command in the draw list names it.
-    GlTargetUse GetUse() const;
-    std::shared_ptr<GlFrameBuffer> const& GetFrameBuffer() const { return mFrameBuffer; }
+    GlTargetUse const& GetUse() const { return mUse; }
+    std::shared_ptr<GlFrameBuffer> const& GetFrameBuffer() const { return mUse.frameBuffer; }
 
     // No depth-stencil buffer afterwards. Commands in the draw list name the one they were made with.
     void Detach();
@@ -45,9 +45,7 @@ private:
     bool HasStencil() const;
 
     std::shared_ptr<GlContext> const mContext;
-    std::shared_ptr<GlFrameBuffer> const mFrameBuffer;
-    int const mWidth;
-    int const mHeight;
+    GlTargetUse mUse;
     GlDepthStencil* mDepthStencil = nullptr; // attached, not owned
 };
 
