@@ -20,7 +20,6 @@ namespace {
 
 using Moka::Bitmap;
 using Moka::BitmapFactory;
-using Moka::ImageInfo;
 using Moka::String;
 
 constexpr int kSide = 2048;

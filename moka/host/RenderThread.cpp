@@ -144,7 +144,7 @@ bool RenderThread::Call(std::function<void()> const& function) {
     if (!task) return false;
     std::future<bool> result = task->GetResult();
     if (!Post(task.get())) return false;
-    task.release();
+    static_cast<void>(task.release());
     return result.get();
 }
 

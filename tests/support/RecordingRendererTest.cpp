@@ -207,7 +207,9 @@ TEST_F(RecordingRendererTest, UseAfterReleaseAndSecondReleaseAreNoticedEachTime)
     delete texture;
     texture->Bind(0);
     texture->Replace(MakeGradient(2, 2).pixels.data(), 0);
+    // cppcheck-suppress doubleFree ; what this is about
     delete texture;
+    // cppcheck-suppress doubleFree
     delete texture;
     EXPECT_EQ(RendererFactory::CreateOffscreenRenderTarget(texture), nullptr);
     target->Release();

@@ -49,6 +49,7 @@ std::string Format(char const* format, va_list arguments) {
     va_copy(again, arguments);
     int const length = std::vsnprintf(nullptr, 0, format, arguments);
     std::string text(length > 0 ? static_cast<std::size_t>(length) : 0, '\0');
+    // NOLINTNEXTLINE(clang-analyzer-valist.Uninitialized): it is, by va_copy
     if (length > 0) std::vsnprintf(text.data(), text.size() + 1, format, again);
     va_end(again);
     return text;

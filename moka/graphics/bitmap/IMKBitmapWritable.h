@@ -8,7 +8,7 @@
 namespace Moka {
 
 // What a frame buffer's contents may be dropped of when it is deactivated: a set of two bits.
-enum DiscardFramebufferType {
+enum DiscardFramebufferType : int {
     DiscardFramebufferNone = 0,
     DiscardFramebufferColor = 1,
     DiscardFramebufferDepthStencil = 2,

@@ -1,6 +1,7 @@
 #include "moka/graphics/canvas/CanvasState.h"
 
 #include <cstring>
+#include <new>
 
 namespace Moka::detail {
 
@@ -9,8 +10,13 @@ int CanvasState::Save(IMKCanvasBase::SaveFlag flag) {
     Level level = mLevels.empty() ? Level() : mLevels.back();
     if (all || flag == IMKCanvasBase::SaveMatrix) level.matrix = matrix;
     if (all || flag == IMKCanvasBase::SaveClip) level.clipCount = clipCount;
-    mLevels.push_back(level);
-    return static_cast<int>(mLevels.size()) - 1;
+    int const index = static_cast<int>(mLevels.size());
+    try {
+        mLevels.push_back(level);
+    } catch (std::bad_alloc const&) {
+        // No memory, no level: restoring to this index does nothing, as to any other that does not exist.
+    }
+    return index;
 }
 
 bool CanvasState::Restore(int level) {

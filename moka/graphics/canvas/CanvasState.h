@@ -16,7 +16,8 @@ public:
     int clipCount = 0; // clips asked for, whether or not the queue took them
 
     // The index of the new level. A part that the flag leaves out gets what it had in the level below, or the
-    // identity or 0 without one, so that restoring resets it. Relied upon.
+    // identity or 0 without one, so that restoring resets it. Relied upon. When memory runs out there is no
+    // new level, and the index is that of none.
     int Save(IMKCanvasBase::SaveFlag flag);
     // False, and nothing changes, for a level that does not exist. A negative one is the last.
     bool Restore(int level);

@@ -14,10 +14,11 @@ class IMKBitmap;
 
 class IMKCanvasBase {
 public:
-    enum SaveFlag { SaveAll = 0, SaveMatrix = 1, SaveClip = 2 };
+    // Any number may come, named or not, here and for ClipOp.
+    enum SaveFlag : int { SaveAll = 0, SaveMatrix = 1, SaveClip = 2 };
 
     // How a clip rectangle R changes the allowed area A.
-    enum ClipOp {
+    enum ClipOp : int {
         Intersect = 0,         // A and R
         Replace = 1,           // R
         Union = 2,             // A or R

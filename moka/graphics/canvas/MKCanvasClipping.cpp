@@ -7,6 +7,7 @@
 #include "moka/renderer/RendererFactory.h"
 
 #include <algorithm>
+#include <new>
 
 namespace Moka {
 namespace {
@@ -37,7 +38,11 @@ MKCanvasClipping::~MKCanvasClipping() {
 }
 
 void MKCanvasClipping::AddClipRectRT(ClipInfo const& info) {
-    mClips.push_back(info);
+    try {
+        mClips.push_back(info);
+    } catch (std::bad_alloc const&) {
+        return; // as if the queue had refused the request
+    }
     mDirty = true;
 }
 
@@ -49,7 +54,11 @@ void MKCanvasClipping::RemoveClipRectRT(int count) {
     std::size_t const wanted = static_cast<std::size_t>(std::max(count, 0));
     ClipInfo empty;
     empty.matrix = Matrix3<float>(0.0f); // not the identity; relied upon
-    mClips.resize(std::min(wanted, std::max(mClips.size(), kMostByCount)), empty);
+    try {
+        mClips.resize(std::min(wanted, std::max(mClips.size(), kMostByCount)), empty);
+    } catch (std::bad_alloc const&) {
+        return; // only growing needs memory
+    }
     mDirty = true;
 }
 

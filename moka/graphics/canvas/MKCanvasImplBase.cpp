@@ -45,7 +45,11 @@ MKCanvasImplBase::MKCanvasImplBase(IGLMsgQueue* queue, IMKBitmap* bitmap, bool o
 MKCanvasImplBase::~MKCanvasImplBase() = default;
 
 void MKCanvasImplBase::createClippingRT() {
-    mClipping.reset(new (std::nothrow) MKCanvasClipping(GetBitmap()));
+    try {
+        mClipping.reset(new (std::nothrow) MKCanvasClipping(GetBitmap()));
+    } catch (std::bad_alloc const&) {
+        // Its list of strips did not fit: a canvas without clipping, as when it did not fit itself.
+    }
 }
 
 void MKCanvasImplBase::ClearRT(Vector4<float> const& rgba) {

@@ -1,8 +1,21 @@
 #include "moka/graphics/canvas/MKPenCanvasImpl.h"
 
+#include "moka/graphics/drawable/RendererPtr.h"
+#include "moka/renderer/IBlendStateObject.h"
 #include "moka/renderer/RendererFactory.h"
 
 namespace Moka {
+namespace {
+
+// Foreign code may have left them off, and a commit keeps what nobody has set.
+void SwitchColorWritesOn() {
+    BlendStateDescriptor descriptor(false);
+    descriptor.SetEnabled(false, true);
+    detail::RendererPtr<IBlendStateObject> const state(RendererFactory::CreateBlendStateObject(descriptor));
+    if (state) state->Apply();
+}
+
+} // namespace
 
 MKPenCanvasImpl::MKPenCanvasImpl(IGLMsgQueue* queue, IMKBitmap* bitmap, bool onRenderThread)
     : MKCanvasImplBase(queue, bitmap, onRenderThread) {}
@@ -16,6 +29,7 @@ Matrix4<float> MKPenCanvasImpl::GetCanvasMatrix() const {
 
 void MKPenCanvasImpl::EnableClipRT(int) {
     if (MKCanvasClipping* const clipping = GetClipping()) clipping->EnableClipRT(-1);
+    SwitchColorWritesOn();
     RendererFactory::Commit(); // what is drawn next is not drawn through the renderer
 }
 

@@ -79,6 +79,7 @@ void WriteStrokeBody(CoverageVertex* at, RectF const& rect, RectF const& straigh
 // Each from its place on the outer rectangle to its centre, which every vertex carries.
 void WriteCorners(CornerVertex* at, RectF const& outer, RectF const& centers) {
     auto const corner = [&](float x, float y, float cx, float cy) {
+        // cppcheck-suppress uselessAssignmentPtrArg ; the next corner starts there
         at = WriteQuad(at, {x, y, cx, cy}, {x, cy, cx, cy}, {cx, y, cx, cy}, {cx, cy, cx, cy});
     };
     corner(outer.left, outer.top, centers.left, centers.top);

@@ -35,7 +35,7 @@ void SetParameter(IParameterBinding* handle, void const* value) {
     if (!handle) {
         Throw<NotSupportedException>("ParameterBinding: internal interface is not initialized!");
     }
-    handle->Set(value);
+    handle->Set(value); // cppcheck-suppress nullPointerRedundantCheck ; Throw does not return
 }
 
 } // namespace detail

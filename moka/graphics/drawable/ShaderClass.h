@@ -20,6 +20,7 @@
 #include "moka/renderer/IShaderProgram.h"
 #include "moka/renderer/RendererFactory.h"
 
+// NOLINTBEGIN(bugprone-macro-parentheses): what is declared cannot stand in parentheses
 #define MOKA_SHADER_MEMBER(kind, name) ParameterBinding<BindingType##kind> name;
 #define MOKA_SHADER_BIND(kind, name) name.bind(program, #name);
 
@@ -42,3 +43,4 @@
               UNIFORMS(MOKA_SHADER_BIND)} Class::~Class() {                                                  \
         program->Release();                                                                                  \
     }
+// NOLINTEND(bugprone-macro-parentheses)

@@ -46,7 +46,7 @@ public:
             LogNew(name);
             std::unique_ptr<T> shader(new (std::nothrow) T);
             entry = &Add(Key(name), shader.get());
-            shader.release(); // the entry's now
+            static_cast<void>(shader.release()); // the entry's now
         }
         ++entry->users;
         return static_cast<T*>(entry->shader);

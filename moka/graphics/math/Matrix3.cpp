@@ -71,6 +71,7 @@ Matrix3<T>::Matrix3(T const* elements) {
 
 template <class T>
 bool Matrix3<T>::operator==(Matrix3 const& other) const {
+    // NOLINTNEXTLINE(bugprone-suspicious-memory-comparison): by bits, as declared
     return std::memcmp(mElements, other.mElements, sizeof(mElements)) == 0;
 }
 

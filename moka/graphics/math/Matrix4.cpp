@@ -58,6 +58,7 @@ Matrix4<T>::Matrix4(T const* elements) {
 
 template <class T>
 bool Matrix4<T>::operator==(Matrix4 const& other) const {
+    // NOLINTNEXTLINE(bugprone-suspicious-memory-comparison): by bits, as declared
     return std::memcmp(mElements, other.mElements, sizeof(mElements)) == 0;
 }
 

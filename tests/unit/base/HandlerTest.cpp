@@ -222,7 +222,7 @@ public:
         mThread = std::thread([this, setUp] {
             MessageLoop loop;
             if (setUp) setUp();
-            mLoop = &loop;
+            mLoop = &loop; // cppcheck-suppress danglingLifetime ; not used after Run()
             loop.Run();
         });
         while (!mLoop) std::this_thread::yield();

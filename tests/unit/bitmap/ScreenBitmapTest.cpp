@@ -7,6 +7,8 @@
 
 #include <gmock/gmock.h>
 
+#include <limits>
+
 namespace Moka::Testing {
 namespace {
 
@@ -46,6 +48,13 @@ protected:
 
 void Store(unsigned pixel, void* userData) { *static_cast<unsigned*>(userData) = pixel; }
 void Count(Rect const&, void*, void* userData) { ++*static_cast<int*>(userData); }
+
+TEST_F(ScreenBitmap, AnEdgeBeyondTheRangeOfIntIsCutToIt) {
+    constexpr int kMost = std::numeric_limits<int>::max();
+    constexpr int kLeast = std::numeric_limits<int>::min();
+    auto const screen = NewScreen(kMost - 1, kLeast, 20, -2);
+    EXPECT_EQ(screen->GetBitmapRect(), Rect(kMost - 1, kLeast, kMost, kLeast));
+}
 
 TEST_F(ScreenBitmap, StandsForTheFrameBufferAskedForAndClonesForTheOther) {
     auto const usual = NewScreen(3, 4, 20, 10);

@@ -393,5 +393,17 @@ TEST_F(ClipCounts, WhatTheRendererRefusesLeavesDrawingUnclippedNotBroken) {
     }
 }
 
+TEST_F(Clipping, NumbersWithoutANameAddNothing) {
+    Clip(0, 0, 10, 10);
+    Clip(5, 5, 10, 10, Union);
+    canvas->DrawRect(0, 0, 50, 60, &paint);
+    std::vector<std::string> const steps = TakeStencilSteps();
+    EXPECT_THAT(steps, SizeIs(5));
+    Clip(5, 5, 10, 10, static_cast<IMKCanvasBase::ClipOp>(-77));
+    canvas->Save(static_cast<IMKCanvasBase::SaveFlag>(77));
+    canvas->DrawRect(0, 0, 50, 60, &paint);
+    EXPECT_EQ(TakeStencilSteps(), steps);
+}
+
 } // namespace
 } // namespace Moka::Testing

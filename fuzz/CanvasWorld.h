@@ -1,0 +1,103 @@
+// CanvasWorld: the bitmaps, canvases and drawables that one fuzzer input makes, uses and drops, over the
+// recording renderer and a queue that runs when the input says so.
+// Owner:   everything made; the destructor gives it back, in the order the input ended with, runs the queue
+//          and requires that no GPU object is left and none was misused.
+// Thread:  one, which stands for the render thread while tasks run and while a render-thread object is used.
+// Limits:  bitmaps of at most kMaxSide a side, strips of kMaxTexture rows, so that an input takes no time.
+#pragma once
+
+#include "fuzz/FuzzInput.h"
+#include "moka/base/RefPtr.h"
+#include "moka/graphics/bitmap/IMKBitmap.h"
+#include "moka/graphics/canvas/IMKCanvas.h"
+#include "moka/graphics/canvas/IMKPenCanvas.h"
+#include "moka/graphics/drawable/IMKCustomDrawable.h"
+#include "tests/support/Queues.h"
+#include "tests/support/RecordingRenderer.h"
+
+#include <array>
+#include <memory>
+#include <vector>
+
+namespace Moka::Fuzz {
+
+constexpr int kMaxTexture = 64;
+constexpr int kMaxSide = 200;
+
+// Declares this thread the render thread, or not.
+class ThreadScope {
+public:
+    explicit ThreadScope(bool onRenderThread) : mOn(onRenderThread) {
+        if (mOn) Testing::RecordingRenderer::DeclareRenderThread();
+    }
+    ~ThreadScope() {
+        if (mOn) Testing::RecordingRenderer::DeclareNoRenderThread();
+    }
+    ThreadScope(ThreadScope const&) = delete;
+    ThreadScope& operator=(ThreadScope const&) = delete;
+
+private:
+    bool mOn;
+};
+
+// A reference, and which thread the object belongs to.
+template <class T>
+struct Slot {
+    RefPtr<T> object;
+    bool onRenderThread = false;
+
+    // The reference held before is given back where it belongs.
+    void Put(RefPtr<T> next, bool nextOnRenderThread) {
+        ThreadScope const scope(onRenderThread);
+        object = std::move(next);
+        onRenderThread = nextOnRenderThread;
+    }
+    void Drop() { Put({}, false); }
+};
+
+class CanvasWorld {
+public:
+    explicit CanvasWorld(FuzzInput& input);
+    ~CanvasWorld();
+    CanvasWorld(CanvasWorld const&) = delete;
+    CanvasWorld& operator=(CanvasWorld const&) = delete;
+
+    Slot<IMKBitmap>& PickBitmap() { return Pick(bitmaps); }
+    Slot<IMKCanvas>& PickCanvas() { return Pick(canvases); }
+    Slot<IMKPenCanvas>& PickPenCanvas() { return Pick(penCanvases); }
+    Slot<IMKCustomDrawable>& PickDrawable() { return Pick(drawables); }
+
+    // A bitmap that an object of this flavour may use; null when the picked one is of the other.
+    IMKBitmap* PickBitmapFor(bool onRenderThread);
+
+    // Memory that stays until the end, since the queue may read or write it then.
+    unsigned char* NewBuffer(std::size_t count);
+
+    FuzzInput& input;
+    Testing::HandPumpedQueue queue;
+    std::array<Slot<IMKBitmap>, 6> bitmaps;
+    std::array<Slot<IMKCanvas>, 4> canvases;
+    std::array<Slot<IMKPenCanvas>, 2> penCanvases;
+    std::array<Slot<IMKCustomDrawable>, 3> drawables;
+
+private:
+    template <class T, std::size_t count>
+    Slot<T>& Pick(std::array<Slot<T>, count>& slots) {
+        return slots[static_cast<std::size_t>(input.Below(static_cast<int>(count)))];
+    }
+    void DropAll();
+
+    std::vector<std::unique_ptr<unsigned char[]>> mBuffers;
+};
+
+// One operation out of the input's next bytes.
+using Operation = void (*)(CanvasWorld& world);
+
+// On bitmaps: make, share, update, read, drop.
+std::vector<Operation> const& GetBitmapOperations();
+// On canvases: make, share, drop; their state, and what pen canvases have.
+std::vector<Operation> const& GetCanvasOperations();
+// What a canvas draws.
+std::vector<Operation> const& GetDrawOperations();
+
+} // namespace Moka::Fuzz

@@ -1,0 +1,94 @@
+// Reads bytes as a scene file and, where it is one of few operations, draws it over the recording renderer. A
+// text that is no scene is refused with a message of one line that begins with the file and a line of it.
+#include "fuzz/CanvasWorld.h"
+#include "moka/base/log/LogSink.h"
+#include "moka/graphics/bitmap/MKGraphicsFactory.h"
+#include "scenes/SceneError.h"
+#include "scenes/SceneFile.h"
+#include "scenes/SceneRenderer.h"
+#include "scenes/SceneText.h"
+
+#include <algorithm>
+#include <cctype>
+#include <string>
+
+namespace Moka::Fuzz {
+namespace {
+
+using Scenes::Scene;
+using Scenes::SceneValue;
+
+constexpr double kMostDrawn = 500;
+constexpr double kMostPixels = 1 << 18;
+
+// How often the most repeated value is drawn, or more: every number that can repeat something counts.
+double CountRepetitions(SceneValue const& value) {
+    double own = 1;
+    double within = 0;
+    for (std::size_t i = 0; i < value.items.size(); ++i) {
+        bool const isNamed = value.kind == SceneValue::Kind::Object;
+        std::string const name = isNamed ? value.keys[i] : std::string();
+        if (name == "count" || name == "columns" || name == "rows")
+            own *= std::max(1.0, value.items[i].number);
+        within += CountRepetitions(value.items[i]);
+        // A group repeats what stands beside its "repeat".
+        if (name == "repeat") own *= CountRepetitions(value.items[i]);
+    }
+    return own * std::max(1.0, within);
+}
+
+double CountPixels(SceneValue const& value) {
+    double sum = 0;
+    double area = 1;
+    for (std::size_t i = 0; i < value.items.size(); ++i) {
+        if (value.kind == SceneValue::Kind::Object && (value.keys[i] == "width" || value.keys[i] == "height"))
+            area *= std::max(1.0, value.items[i].number);
+        sum += CountPixels(value.items[i]);
+    }
+    return sum + area;
+}
+
+void Draw(Scene const& scene, FuzzInput& input) {
+    CanvasWorld world(input);
+    Scenes::QueueStage stage(world.queue);
+    auto const target = RefPtr<IMKBitmap>::Adopt(
+        MKGraphicsFactory::CreateBitmap(&world.queue, std::min(scene.width, kMaxSide),
+                                        std::min(scene.height, kMaxSide), nullptr, false, 1, false));
+    auto const canvas =
+        RefPtr<IMKCanvas>::Adopt(MKGraphicsFactory::CreateCanvas(&world.queue, target.Get(), 1));
+    Scenes::DrawScene(scene, *canvas, stage);
+}
+
+void RequireMessage(std::string const& text) {
+    bool const begins = text.rfind("fuzz.json:", 0) == 0 && text.size() > 10;
+    Require(begins && std::isdigit(static_cast<unsigned char>(text[10])) != 0,
+            "no file and line in a message");
+}
+
+void ReadAndDraw(std::string_view text) {
+    FuzzInput nothing(nullptr, 0);
+    try {
+        SceneValue const root = Scenes::ParseSceneText(text);
+        if (CountPixels(root) > kMostPixels) return;
+        bool const isSmall = CountRepetitions(root) <= kMostDrawn;
+        Scene const scene = Scenes::ParseScene(text, "fuzz.json", "no-such-folder");
+        if (isSmall) Draw(scene, nothing);
+    } catch (Scenes::SceneLineError const&) {
+        // Out of the tree, which knows no file.
+    } catch (Scenes::SceneError const& error) {
+        RequireMessage(error.what());
+    }
+}
+
+} // namespace
+} // namespace Moka::Fuzz
+
+extern "C" int LLVMFuzzerInitialize(int*, char***) {
+    Moka::SetLogSink([](Moka::LogLine const&) {});
+    return 0;
+}
+
+extern "C" int LLVMFuzzerTestOneInput(std::uint8_t const* data, std::size_t size) {
+    Moka::Fuzz::ReadAndDraw({reinterpret_cast<char const*>(data), size});
+    return 0;
+}
