@@ -28,6 +28,8 @@ char const* GetTitle(SceneGroup group) {
         return "Custom drawables";
     case SceneGroup::Screen:
         return "Screen";
+    case SceneGroup::PenCanvas:
+        return "Pen canvas";
     }
     return "";
 }

@@ -1,4 +1,5 @@
 #include "scenes/CustomScenes.h"
+#include "scenes/PenScenes.h"
 #include "scenes/SceneError.h"
 #include "scenes/SceneFile.h"
 #include "scenes/SceneTexts.h"
@@ -66,8 +67,10 @@ Scene ReadEntry(Entry const& entry) {
 std::vector<Scene> MakeScenes() {
     std::vector<Scene> scenes;
     std::transform(std::begin(kEntries), std::end(kEntries), std::back_inserter(scenes), ReadEntry);
-    std::vector<Scene> custom = MakeCustomScenes();
-    std::move(custom.begin(), custom.end(), std::back_inserter(scenes));
+    for (auto const make : {MakeCustomScenes, MakePenScenes}) {
+        std::vector<Scene> made = make();
+        std::move(made.begin(), made.end(), std::back_inserter(scenes));
+    }
     std::stable_sort(scenes.begin(), scenes.end(),
                      [](Scene const& a, Scene const& b) { return a.group < b.group; });
     return scenes;

@@ -56,12 +56,12 @@ IMKBitmap* QueueStage::MakeBitmap(Picture const& picture) {
     return bitmap;
 }
 
-Picture RenderScene(Scene const& scene, IGLMsgQueue& queue) {
+Picture RenderScene(Scene const& scene, IGLMsgQueue& queue, ScenePen* pen) {
     RefPtr<IMKBitmap> const target = MakeTarget(scene, queue);
     CheckStrips(scene, *target, queue);
     auto const canvas = RefPtr<IMKCanvas>::Adopt(MKGraphicsFactory::CreateCanvas(&queue, target.Get(), 1));
     if (!canvas) throw SceneError(scene.name + ": there is no room for a canvas");
-    QueueStage stage(queue);
+    QueueStage stage(queue, pen);
     DrawScene(scene, *canvas, stage);
     Picture picture(scene.width, scene.height);
     target->GetBitmapData(target->GetBitmapRect(), picture.pixels.data());

@@ -10,17 +10,20 @@ namespace Moka::Scenes {
 // Bitmaps on the GPU, for canvases on any thread but the render thread.
 class QueueStage final : public SceneStage {
 public:
-    explicit QueueStage(IGLMsgQueue& queue) : mQueue(queue) {}
+    // Both outlive the stage; the pen may be null.
+    explicit QueueStage(IGLMsgQueue& queue, ScenePen* pen = nullptr) : mQueue(queue), mPen(pen) {}
 
     IMKBitmap* MakeBitmap(Picture const& picture) override;
     IGLMsgQueue* GetQueue() override { return &mQueue; }
+    ScenePen* GetPen() override { return mPen; }
 
 private:
     IGLMsgQueue& mQueue;
+    ScenePen* const mPen;
 };
 
 // A scene for the screen is drawn on the default frame buffer, which has to be as large as the scene.
 // Fails: throws SceneError when there is no room for the target or a bitmap.
-Picture RenderScene(Scene const& scene, IGLMsgQueue& queue);
+Picture RenderScene(Scene const& scene, IGLMsgQueue& queue, ScenePen* pen = nullptr);
 
 } // namespace Moka::Scenes

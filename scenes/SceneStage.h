@@ -1,5 +1,5 @@
 // SceneStage: what a scene needs besides a canvas: bitmaps that the canvas can draw, and for scenes that make
-// objects of the GPU, the queue.
+// objects of the GPU, the queue, and ink.
 // Thread: one at a time, the one that draws the scene.
 #pragma once
 
@@ -13,6 +13,7 @@ class IMKBitmap;
 namespace Moka::Scenes {
 
 struct Picture;
+class ScenePen;
 
 class SceneStage {
 public:
@@ -24,6 +25,9 @@ public:
 
     // Null where there is no GPU; see Scene::needsGpu.
     virtual IGLMsgQueue* GetQueue() = 0;
+
+    // Null where nobody brought one; see Scene::needsPen.
+    virtual ScenePen* GetPen() { return nullptr; }
 };
 
 } // namespace Moka::Scenes

@@ -7,12 +7,10 @@
 #include "apps/moka/Interruption.h"
 #include "apps/moka/LogCollector.h"
 #include "apps/moka/Progress.h"
-#include "moka/base/String.h"
 
 #include <CLI/CLI.hpp>
 #include <cstdint>
 #include <cstdio>
-#include <filesystem>
 #include <memory>
 #include <string>
 #include <vector>
@@ -20,10 +18,6 @@
 namespace Moka::Tool {
 namespace {
 
-namespace fs = std::filesystem;
-
-constexpr int kJpegQuality = 90;
-constexpr int kLosslessQuality = 100;
 constexpr int kUnset = -1;
 constexpr int kInFlight = 4;
 constexpr int kMaxInFlight = 64;
@@ -67,20 +61,6 @@ std::string CheckSize(std::string const& text) {
     return "'" + text + "' is no size; write WIDTHxHEIGHT, each 1 to 65535, together within 1 GiB of pixels";
 }
 
-// Before any work, so that nobody waits for a conversion that cannot be saved.
-void CheckOutput(std::string const& output) {
-    String const text(output);
-    if (BitmapFactory::GetFormatByExtension(&text) == ImageFormat::Unknown)
-        throw Failure(ExitStatus::Usage,
-                      output + ": its extension names no format; use .png, .jpg, .jpeg, .webp or .mki");
-    std::error_code error;
-    fs::path const path(output);
-    if (fs::is_directory(path, error)) throw Failure(output + " is a folder; name a file to write");
-    // Where a link leads is found out when saving.
-    if (fs::is_symlink(path, error)) return;
-    CheckFolder(output, path.has_parent_path() ? path.parent_path().string() : ".", ExitStatus::Failed);
-}
-
 // What stands before the driver's details: "llvmpipe (LLVM 15.0.6, 256 bits)".
 std::string ShortName(std::string const& renderer) { return renderer.substr(0, renderer.find(" (")); }
 
@@ -113,10 +93,7 @@ std::string TakeOutput(ConvertOptions const& options) {
 ConversionOptions Complete(ConvertOptions const& options, std::string const& output) {
     ConversionOptions conversion = options.conversion;
     if (!options.size.empty()) ParseSize(options.size, conversion.width, conversion.height);
-    String const text(output);
-    bool const isJpeg = BitmapFactory::GetFormatByExtension(&text) == ImageFormat::Jpeg;
-    int const usual = isJpeg ? kJpegQuality : kLosslessQuality;
-    conversion.quality = options.quality == kUnset ? usual : options.quality;
+    conversion.quality = options.quality == kUnset ? GetUsualQuality(output) : options.quality;
     return conversion;
 }
 

@@ -6,14 +6,11 @@
 #include "apps/moka/LogCollector.h"
 #include "apps/moka/Progress.h"
 #include "apps/moka/SceneDrawing.h"
-#include "moka/base/BitmapFactory.h"
-#include "moka/base/String.h"
 #include "scenes/SceneError.h"
 #include "scenes/SceneFile.h"
 
 #include <CLI/CLI.hpp>
 #include <cstdio>
-#include <filesystem>
 #include <memory>
 #include <string>
 
@@ -31,16 +28,6 @@ struct DrawOptions {
     std::string input;
     std::string output;
 };
-
-// Before any work, so that nobody waits for a picture that cannot be saved.
-void CheckOutput(std::string const& output) {
-    String const name(output);
-    if (BitmapFactory::GetFormatByExtension(&name) == ImageFormat::Unknown)
-        throw Failure(ExitStatus::Usage,
-                      output + ": its extension names no format; use .png, .jpg, .jpeg, .webp or .mki");
-    std::string const folder = std::filesystem::path(output).parent_path().string();
-    CheckFolder(output, folder.empty() ? "." : folder, ExitStatus::Failed);
-}
 
 Scenes::Scene Load(std::string const& path, LogCollector const& log) {
     try {

@@ -1,24 +1,16 @@
 #include "apps/moka/SceneDrawing.h"
 
+#include "apps/moka/Arguments.h"
 #include "apps/moka/Failure.h"
 #include "apps/moka/Interruption.h"
 #include "apps/moka/LogCollector.h"
+#include "apps/moka/PenStroke.h"
 #include "moka/base/Bitmap.h"
 #include "moka/base/BitmapFactory.h"
 #include "moka/base/String.h"
 #include "scenes/SceneError.h"
 
 namespace Moka::Tool {
-namespace {
-
-constexpr int kJpegQuality = 90;
-constexpr int kLosslessQuality = 100;
-
-int GetQuality(String const& path) {
-    return BitmapFactory::GetFormatByExtension(&path) == ImageFormat::Jpeg ? kJpegQuality : kLosslessQuality;
-}
-
-} // namespace
 
 std::unique_ptr<RenderThread> StartForScene(RenderThreadOptions const& options, LogCollector& log) {
     std::string error;
@@ -35,7 +27,8 @@ Scenes::Picture DrawOnGpu(Scenes::Scene const& scene, RenderThread& queue, LogCo
         throw Failure(scene.name + " is " + std::to_string(scene.width) +
                       " pixels wide; this device takes textures up to " + std::to_string(largest));
     try {
-        Scenes::Picture picture = RenderScene(scene, queue);
+        PenStroke pen(queue);
+        Scenes::Picture picture = RenderScene(scene, queue, &pen);
         std::string const error = log.GetError();
         if (error.empty()) return picture;
         throw Failure(scene.name + ": " + error);
@@ -52,7 +45,7 @@ void SavePicture(Scenes::Picture const& picture, std::string const& path, LogCol
                     static_cast<int>(picture.GetStride()), Bitmap::kFormatRgba8888, false, false);
     String const name(path);
     Interruption::Saving const saving(interruption);
-    if (!BitmapFactory::SaveBitmap(&image, &name, GetQuality(name))) log.Throw("cannot save " + path);
+    if (!BitmapFactory::SaveBitmap(&image, &name, GetUsualQuality(path))) log.Throw("cannot save " + path);
 }
 
 } // namespace Moka::Tool

@@ -108,6 +108,30 @@ TEST_F(GalleryTest, TheScreenLooksLikeATexture) {
     EXPECT_LE(CompareImages(screen, texture).differingPixels, 12);
 }
 
+// The panels are painted by the canvas, under and over the ink; the ink is cut by clips alone.
+TEST_F(GalleryTest, InkEndsAtItsClip) {
+    RunWell({"gallery", "--out", ".", "--only", "pen-stroke"});
+    TestImage const image = Load("pen-stroke.png");
+    ASSERT_EQ(image.width, 480);
+    auto const isInk = [&](int x, int y) { return image.GetColor(x, y) == Color{42, 74, 106, 255}; };
+    auto const isPaper = [&](int x, int y) { return image.GetColor(x, y) == Color{247, 245, 240, 255}; };
+    int inkInside = 0;
+    int notPaperOutside = 0;
+    for (int y = 0; y < image.height; ++y) {
+        for (int x = 170; x < image.width; ++x) {
+            bool const isFirst = x >= 190 && x < 290 && y >= 40 && y < 90;
+            bool const isSecond = x >= 360 && x < 440 && y >= 25 && y < 115;
+            inkInside += (isFirst || isSecond) && isInk(x, y);
+            // Half of a frame lies outside.
+            bool const isNear =
+                (x >= 188 && x < 292 && y >= 38 && y < 92) || (x >= 358 && x < 442 && y >= 23 && y < 117);
+            notPaperOutside += !isNear && !isPaper(x, y);
+        }
+    }
+    EXPECT_GT(inkInside, 1000);
+    EXPECT_EQ(notPaperOutside, 0);
+}
+
 TEST_F(GalleryTest, WrongUsageAndFoldersThatCannotBeMade) {
     WriteFile("file", "no folder");
     struct Case {

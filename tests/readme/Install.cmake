@@ -1,4 +1,5 @@
-# Installs BUILD into FOLDER, builds SOURCE with GENERATOR and find_package(MokaGraphics), and runs it on PICTURE.
+# Installs BUILD into FOLDER, builds SOURCE with GENERATOR and find_package(MokaGraphics), runs it,
+# and has CHECK look at the picture.
 set(project ${FOLDER}/project)
 file(REMOVE_RECURSE ${FOLDER}/installed ${project})
 file(MAKE_DIRECTORY ${project})
@@ -19,4 +20,5 @@ run(${CMAKE_COMMAND} --install ${BUILD} --prefix ${FOLDER}/installed)
 run(${CMAKE_COMMAND} -G ${GENERATOR} -S ${project} -B ${project}/build
   -DCMAKE_PREFIX_PATH=${FOLDER}/installed)
 run(${CMAKE_COMMAND} --build ${project}/build)
-run(${project}/build/user ${PICTURE} ${project}/written.mki)
+run(${project}/build/user ${project}/drawn.png)
+run(${CHECK} ${project}/drawn.png)

@@ -47,7 +47,7 @@ public:
     void PreTranslate(float tx, float ty) override { mMatrix.preTranslate(tx, ty); }
     void PostTranslate(float tx, float ty) override { mMatrix.postTranslate(tx, ty); }
 
-    void SetTag(char const* tag) override { mTag = tag; }
+    void SetTag(char const* tag) override { mTag = tag ? tag : ""; }
     char const* GetTag() override { return mTag.c_str(); }
     IGLMsgQueue* GetMsgQueue() override { return nullptr; }
     IMKBitmap* GetBitmap() override { return &mTarget; }

@@ -45,7 +45,7 @@ TEST(SceneRegistry, EverySceneDraws) {
     }
 }
 
-TEST(SceneRegistry, CustomDrawablesAreRefusedWhereThereIsNoGpu) {
+TEST(SceneRegistry, CustomDrawablesAndInkAreRefusedWhereThereIsNoGpu) {
     class NoQueue : public Scenes::SceneStage {
         IMKBitmap* MakeBitmap(Picture const&) override { return nullptr; }
         IGLMsgQueue* GetQueue() override { return nullptr; }
@@ -57,7 +57,7 @@ TEST(SceneRegistry, CustomDrawablesAreRefusedWhereThereIsNoGpu) {
         EXPECT_THROW(DrawScene(scene, *canvas, stage), Scenes::SceneError) << scene.name;
         ++count;
     }
-    EXPECT_EQ(count, 4);
+    EXPECT_EQ(count, 5);
 }
 
 TEST(SceneRegistry, TallScenesHaveExactlyThreeStrips) {

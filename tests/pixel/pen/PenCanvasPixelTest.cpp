@@ -1,0 +1,237 @@
+// The pen canvas around real foreign GL: the ink lies where its matrix and clip say, and whatever the foreign
+// code leaves behind, the library's own draws before and after it are right.
+#include "moka/base/RefPtr.h"
+#include "moka/base/log/AndroidLog.h"
+#include "moka/graphics/bitmap/IMKBitmap.h"
+#include "moka/graphics/bitmap/IMKBitmapWritable.h"
+#include "moka/graphics/bitmap/MKGraphicsFactory.h"
+#include "moka/graphics/canvas/IMKCanvas.h"
+#include "moka/graphics/canvas/IMKPenCanvas.h"
+#include "moka/graphics/canvas/MKPaint.h"
+#include "moka/host/RenderThread.h"
+#include "moka/renderer/RendererFactory.h"
+#include "tests/pixel/pen/ForeignInk.h"
+#include "tests/support/ImageCompare.h"
+#include "tests/support/LogCapture.h"
+#include "tests/support/TestImages.h"
+
+#include <functional>
+#include <gtest/gtest.h>
+#include <memory>
+#include <string>
+#include <vector>
+
+namespace Moka::Testing {
+namespace {
+
+using BitmapPtr = RefPtr<IMKBitmap>;
+using C = IMKCanvasBase;
+
+constexpr int kWidth = 40;
+constexpr int kHeight = 26;
+constexpr Color kPaper{10, 20, 30, 255};
+constexpr Color kInk{0, 255, 0, 255};
+constexpr Vector4<float> kInkColor{0, 1, 0, 1};
+
+TestImage Paper() { return MakeChecker(kWidth, kHeight, kWidth + kHeight, kPaper, kPaper); }
+
+void FillImage(TestImage& image, Rect const& r, Color const& color) {
+    for (int y = r.top; y < r.bottom; ++y)
+        for (int x = r.left; x < r.right; ++x) image.SetColor(x, y, color);
+}
+
+// With deferral, and without.
+class PenCanvasPixel : public ::testing::TestWithParam<bool> {
+protected:
+    void SetUp() override {
+        RenderThreadOptions options;
+        options.debugContext = true;
+        std::string error;
+        queue = RenderThread::Start(options, &error);
+        ASSERT_TRUE(queue) << error;
+        queue->Call([this] {
+            RendererFactory::SetDeferred(GetParam());
+            ink = std::make_unique<ForeignInk>();
+        });
+        bitmap = Create(Paper());
+        pen = RefPtr<IMKPenCanvas>::Adopt(MKGraphicsFactory::CreatePenCanvas(queue.get(), bitmap.Get(), 1));
+        canvas = RefPtr<IMKCanvas>::Adopt(MKGraphicsFactory::CreateCanvas(queue.get(), bitmap.Get(), 1));
+    }
+
+    // Nothing alive on the GPU, and no driver message of error severity.
+    void TearDown() override {
+        pen = {};
+        canvas = {};
+        bitmap = {};
+        queue->Call([this] {
+            RendererFactory::Flush();
+            ink.reset();
+            RendererFactory::InvalidateState();
+        });
+        queue->WaitForTasks();
+        RendererStatistics const s = RendererFactory::GetStatistics();
+        EXPECT_EQ(s.textures + s.frameBuffers + s.programs + s.graphicsObjects + s.stateObjects, 0);
+        EXPECT_EQ(s.errors, 0u);
+        queue.reset();
+        for (std::string const& line : log.GetTexts(ANDROID_LOG_ERROR)) ADD_FAILURE() << line;
+    }
+
+    BitmapPtr Create(TestImage const& image) {
+        auto created = BitmapPtr::Adopt(MKGraphicsFactory::CreateBitmap(
+            queue.get(), image.width, image.height, image.pixels.data(), false, 1, false));
+        queue->WaitForTasks(); // the image may go
+        return created;
+    }
+
+    TestImage Read() {
+        TestImage image(kWidth, kHeight);
+        bitmap->GetBitmapData(bitmap->GetBitmapRect(), image.pixels.data());
+        return image;
+    }
+
+    // What the pen engine does on the render thread, behind what was asked for before.
+    void DrawInk(RectF const& rect) {
+        queue->Call([&] {
+            pen->EnableClipRT(0);
+            bitmap->GetBitmapWritable()->ActivateFrameBufferRT(false);
+            ink->Fill(rect, pen->GetCanvasMatrix(), kInkColor);
+            ink->LeaveAMess();
+            pen->DisableClipRT();
+            bitmap->GetBitmapWritable()->DeactivateFrameBufferRT(false, DiscardFramebufferNone);
+        });
+    }
+
+    static void ExpectSame(TestImage const& expected, TestImage const& actual, std::string const& what) {
+        ImageDifference const difference = CompareImages(expected, actual);
+        if (difference.differingPixels == 0) return;
+        ADD_FAILURE() << what << ": " << difference << "; " << KeepDifference(expected, actual, what);
+    }
+
+    LogCapture log;
+    std::unique_ptr<RenderThread> queue;
+    std::unique_ptr<ForeignInk> ink; // render thread
+    BitmapPtr bitmap;
+    RefPtr<IMKPenCanvas> pen;
+    RefPtr<IMKCanvas> canvas;
+};
+
+struct Clip {
+    int x, y, width, height;
+    C::ClipOp op;
+};
+
+TEST_P(PenCanvasPixel, InkIsDrawnInsideTheClipAndNotOutside) {
+    struct Case {
+        std::vector<Clip> clips; // in pixels of the bitmap
+        Rect inked;
+    };
+    for (Case const& c :
+         {Case{{}, Rect(4, 2, 24, 12)}, Case{{{6, 0, 10, 26, C::Intersect}}, Rect(6, 2, 16, 12)},
+          Case{{{6, 0, 10, 26, C::Intersect}, {0, 5, 40, 4, C::Intersect}}, Rect(6, 5, 16, 9)},
+          Case{{{0, 0, 3, 3, C::Intersect}, {10, 4, 8, 3, C::Replace}}, Rect(10, 4, 18, 7)},
+          Case{{{4, 2, 5, 5, C::Intersect}, {20, 2, 4, 9, C::Intersect}}, Rect(0, 0, 0, 0)}}) {
+        canvas->ClearAll(10 / 255.0f, 20 / 255.0f, 30 / 255.0f, 1);
+        int const level = pen->Save(C::SaveAll);
+        for (Clip const& clip : c.clips) pen->SetClipRect(clip.x, clip.y, clip.width, clip.height, clip.op);
+        pen->PreTranslate(4, 2);
+        pen->PreScale(2, 1);
+        DrawInk(RectF(0, 0, 10, 10)); // covers (4, 2) to (24, 12)
+        pen->Restore(level);
+        TestImage expected = Paper();
+        FillImage(expected, c.inked, kInk);
+        ExpectSame(expected, Read(), "ink under " + std::to_string(c.clips.size()) + " clips");
+    }
+    EXPECT_EQ(log.GetTexts(ANDROID_LOG_WARN).size(), 0u);
+}
+
+// The bitmap counts as one frame buffer for a pen, and that has no stencil.
+TEST_P(PenCanvasPixel, ATurnedClipAnnouncesItselfAndCutsNothing) {
+    pen->PreRotate(30, 20, 13);
+    pen->SetClipRect(18, 11, 4, 4, C::Intersect);
+    DrawInk(RectF(-100, -100, 100, 100));
+    TestImage expected(kWidth, kHeight);
+    FillImage(expected, Rect(0, 0, kWidth, kHeight), kInk);
+    ExpectSame(expected, Read(), "ink under a turned clip");
+    EXPECT_EQ(log.GetTexts(ANDROID_LOG_WARN).size(), 2u);
+
+    // The clip ends with the ink.
+    MKPaint paint;
+    canvas->DrawRect(0, 0, kWidth, 10, &paint);
+    FillImage(expected, Rect(0, 0, kWidth, 10), Color{255, 255, 255, 255});
+    ExpectSame(expected, Read(), "a rectangle after a turned clip");
+}
+
+TEST_P(PenCanvasPixel, TheMatrixMapsAsTheCanvasDoes) {
+    RectF const rect(2, 3, 21, 12);
+    for (C* const each : {static_cast<C*>(pen.Get()), static_cast<C*>(canvas.Get())}) {
+        each->PreTranslate(7.3f, 4.1f);
+        each->PreRotate(21, 10, 9);
+        each->PreScale(1.1f, 0.9f);
+    }
+    MKPaint paint;
+    paint.SetColor(static_cast<int>(0xFF00FF00));
+    canvas->DrawRect(rect, &paint);
+    TestImage const drawn = Read();
+    canvas->ClearAll(10 / 255.0f, 20 / 255.0f, 30 / 255.0f, 1);
+    DrawInk(rect);
+    ExpectSame(drawn, Read(), "ink where the canvas draws");
+    EXPECT_GT(CompareImages(drawn, Paper()).differingPixels, 100);
+}
+
+// Each of these takes another way through the renderer: plain, blended, textured, clipped by the scissor,
+// clipped by the stencil, cleared, uploaded.
+TEST_P(PenCanvasPixel, OwnDrawsBeforeAndAfterAreRightWhateverIsLeftBehind) {
+    Color const white{255, 255, 255, 255};
+    Color const red{255, 0, 0, 255};
+    TestImage expected = Paper();
+    BitmapPtr const picture = Create(MakeGradient(6, 5));
+    MKPaint paint;
+    canvas->DrawRect(2, 2, 30, 8, &paint); // still in the renderer's hands when the pen comes
+    DrawInk(RectF(10, 4, 16, 20));
+    FillImage(expected, Rect(2, 2, 30, 8), white);
+    FillImage(expected, Rect(10, 4, 16, 20), kInk);
+
+    paint.SetColor(static_cast<int>(0xFFFF0000));
+    canvas->DrawRect(14, 6, 20, 12, &paint);
+    FillImage(expected, Rect(14, 6, 20, 12), red);
+    DrawInk(RectF(0, 0, 1, 1));
+    FillImage(expected, Rect(0, 0, 1, 1), kInk);
+    paint.SetColor(1, 1, 1, 0);
+    canvas->DrawRect(0, 0, 40, 26, &paint); // blends to nothing, unless blending is wrong
+    DrawInk(RectF(1, 0, 2, 1));
+    FillImage(expected, Rect(1, 0, 2, 1), kInk);
+    MKPaint const plain;
+    canvas->DrawBitmap(picture.Get(), 30, 10, &plain);
+    for (int y = 0; y < 5; ++y)
+        for (int x = 0; x < 6; ++x) expected.SetColor(30 + x, 10 + y, GetGradientColor(x, y));
+    ExpectSame(expected, Read(), "drawn around ink");
+
+    DrawInk(RectF(2, 0, 3, 1));
+    FillImage(expected, Rect(2, 0, 3, 1), kInk);
+    canvas->Save(C::SaveClip);
+    canvas->SetClipRect(20, 14, 8, 6, C::Intersect);
+    canvas->DrawRect(0, 0, 40, 26, &plain);
+    FillImage(expected, Rect(20, 14, 28, 20), white);
+    DrawInk(RectF(3, 0, 4, 1));
+    FillImage(expected, Rect(3, 0, 4, 1), kInk);
+    canvas->SetClipRect(4, 18, 4, 3, C::Union);
+    canvas->Clear(1, 0, 0, 1);
+    FillImage(expected, Rect(20, 14, 28, 20), red);
+    FillImage(expected, Rect(4, 18, 8, 21), red);
+    canvas->Restore(-1);
+    ExpectSame(expected, Read(), "clipped around ink");
+
+    DrawInk(RectF(4, 0, 5, 1));
+    FillImage(expected, Rect(4, 0, 5, 1), kInk);
+    BitmapPtr const late = Create(MakeGradient(5, 3));
+    canvas->DrawBitmap(late.Get(), 33, 20, &plain);
+    for (int y = 0; y < 3; ++y)
+        for (int x = 0; x < 5; ++x) expected.SetColor(33 + x, 20 + y, GetGradientColor(x, y));
+    ExpectSame(expected, Read(), "uploaded after ink");
+}
+
+INSTANTIATE_TEST_SUITE_P(Renderer, PenCanvasPixel, ::testing::Values(true, false),
+                         [](auto const& test) { return test.param ? "Deferred" : "Immediate"; });
+
+} // namespace
+} // namespace Moka::Testing

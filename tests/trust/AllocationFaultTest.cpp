@@ -1,0 +1,99 @@
+// Memory runs out at every place where it can, once and for good, in every scenario.
+#include "moka/base/RefPtr.h"
+#include "moka/graphics/bitmap/IMKBitmap.h"
+#include "moka/graphics/bitmap/MKGraphicsFactory.h"
+#include "moka/graphics/canvas/IMKCanvas.h"
+#include "moka/renderer/RendererFactory.h"
+#include "tests/support/RecordingRenderer.h"
+#include "tests/trust/Faults.h"
+#include "tests/trust/TrustFixture.h"
+
+namespace Moka::Testing {
+namespace {
+
+class AllocationFaults : public TrustFixture {
+protected:
+    // Runs the scenario with the k-th allocation failing, for each k that there is and one more.
+    template <class Check>
+    void Sweep(Faults::Kind kind, Check const& check) {
+        std::vector<std::string> const undisturbed = TakeFrame();
+        Faults::Arm(kind, 0, false);
+        RunScenario();
+        int const count = Faults::Disarm();
+        for (bool const all : {false, true})
+            for (int k = 1; k <= count + 1 && !HasFatalFailure(); ++k) {
+                SCOPED_TRACE((all ? "all from " : "only ") + std::to_string(k) + " of " +
+                             std::to_string(count));
+                Faults::Arm(kind, k, all);
+                RunScenario();
+                Faults::Disarm();
+                check(k <= count);
+                ASSERT_EQ(TakeFrame(), undisturbed);
+            }
+        RecordProperty("faults", 2 * (count + 1));
+        EXPECT_GT(count, 0);
+    }
+};
+
+TEST_P(AllocationFaults, AnObjectThatCannotBeMadeLeavesNothingBehind) {
+    int const alive = RecordingRenderer::CountLiveObjects();
+    auto const objects = Faults::CountLive(Faults::Kind::Objects);
+    Sweep(Faults::Kind::Objects, [&](bool) {
+        EXPECT_EQ(RecordingRenderer::CountLiveObjects(), alive);
+        EXPECT_EQ(Faults::CountLive(Faults::Kind::Objects), objects);
+        // A class that memory ran out for has no shader from then on, by design: its drawables draw nothing
+        // until the process ends. For the sweep it ends here, where no shader is in use.
+        ForgetShaders();
+    });
+}
+
+// A request that cannot be made is one that the queue refused: what it would have acted on, given back or
+// deleted may stay for good. So what stays is only looked at where every request was made; which leaks belong
+// to which refusal, RefusingQueueTest knows.
+TEST_P(AllocationFaults, ARequestThatCannotBeMadeIsARefusedOne) {
+    auto const tasks = Faults::CountLive(Faults::Kind::Tasks);
+    Sweep(Faults::Kind::Tasks, [&](bool failed) {
+        EXPECT_EQ(Faults::CountLive(Faults::Kind::Tasks), tasks);
+        int const live = RecordingRenderer::CountLiveObjects();
+        auto const objects = Faults::CountLive(Faults::Kind::Objects);
+        // A drawable that was never deleted keeps its shader in use, with all that was set in it.
+        ForgetShaders();
+        if (failed) return;
+        RunScenario();
+        EXPECT_EQ(RecordingRenderer::CountLiveObjects(), live);
+        EXPECT_EQ(Faults::CountLive(Faults::Kind::Objects), objects);
+    });
+}
+
+// The containers of a canvas: what they have no memory for did not happen, and nobody sees an exception.
+TEST(ThrowingAllocationFaults, ALevelOrAClipThatDoesNotFitIsDropped) {
+    RecordingRenderer::Reset();
+    ASSERT_TRUE(RendererFactory::AttachContext());
+    HandPumpedQueue queue;
+    {
+        auto const target =
+            RefPtr<IMKBitmap>::Adopt(MKGraphicsFactory::CreateBitmap(&queue, 8, 8, nullptr, false, 0, false));
+        auto const canvas =
+            RefPtr<IMKCanvas>::Adopt(MKGraphicsFactory::CreateCanvas(&queue, target.Get(), 0));
+        canvas->PreScale(2, 2);
+        Faults::Arm(Faults::Kind::Throwing, 1, true);
+        int const level = canvas->Save(IMKCanvas::SaveAll);
+        canvas->SetClipRect(0, 0, 1, 1, IMKCanvas::Intersect);
+        int const refused = Faults::Disarm();
+        EXPECT_EQ(refused, 2);
+        EXPECT_EQ(level, 0);
+        canvas->PreScale(3, 3);
+        Matrix3<float> const scaled = canvas->GetMatrix();
+        canvas->Restore(level);
+        EXPECT_TRUE(canvas->GetMatrix() == scaled);
+        canvas->Clear(1, 1, 1, 1);
+        EXPECT_FALSE(RecordingRenderer::GetClears().back().state.scissorOn);
+    }
+    EXPECT_EQ(RecordingRenderer::CountLiveObjects(), 0);
+    RendererFactory::DetachContext();
+}
+
+INSTANTIATE_TEST_SUITE_P(Of, AllocationFaults, ::testing::ValuesIn(GetScenarios()), NameOfScenario);
+
+} // namespace
+} // namespace Moka::Testing

@@ -1,0 +1,122 @@
+// A process that saves is killed at random moments: what lies under a real name is always a whole picture.
+#include "moka/base/Bitmap.h"
+#include "moka/base/BitmapFactory.h"
+#include "moka/base/String.h"
+#include "tests/support/TestImages.h"
+
+#include <atomic>
+#include <chrono>
+#include <filesystem>
+#include <gtest/gtest.h>
+#include <memory>
+#include <random>
+#include <signal.h>
+#include <string>
+#include <sys/mman.h>
+#include <sys/wait.h>
+#include <thread>
+#include <unistd.h>
+
+namespace Moka::Testing {
+namespace {
+
+constexpr int kSaves = 1000;
+constexpr char const* kExtensions[] = {"png", "jpg", "webp", "mki"};
+
+// Seen by parent and child.
+struct Shared {
+    std::atomic<int> saves{0};
+    std::atomic<bool> failed{false};
+};
+
+class CrashTest : public ::testing::Test {
+protected:
+    void SetUp() override {
+        std::filesystem::create_directories(folder);
+        void* const memory =
+            mmap(nullptr, sizeof(Shared), PROT_READ | PROT_WRITE, MAP_SHARED | MAP_ANONYMOUS, -1, 0);
+        ASSERT_NE(memory, MAP_FAILED);
+        shared = new (memory) Shared;
+    }
+    void TearDown() override {
+        munmap(shared, sizeof(Shared));
+        std::filesystem::remove_all(folder);
+    }
+
+    String Path(int i) const { return String((folder / "picture.").string() + kExtensions[i % 4]); }
+
+    // Saves one picture over the other until it is killed.
+    [[noreturn]] void SaveForEver() {
+        TestImage images[] = {MakeGradient(120, 80), MakeChecker(200, 150, 7, {9, 9, 9, 9}, {0, 0, 0, 255})};
+        for (int i = 0;; ++i) {
+            TestImage& image = images[i / 4 % 2];
+            Bitmap bitmap;
+            String const path = Path(i);
+            if (!bitmap.Construct(image.pixels.data(), image.width, image.height, image.GetStride(), 1, false,
+                                  false) ||
+                !BitmapFactory::SaveBitmap(&bitmap, &path, 90))
+                shared->failed = true;
+            ++shared->saves;
+        }
+    }
+
+    void KillSaver(std::chrono::microseconds after) {
+        pid_t const child = fork();
+        ASSERT_GE(child, 0);
+        if (child == 0) SaveForEver();
+        std::this_thread::sleep_for(after);
+        kill(child, SIGKILL);
+        int status = 0;
+        waitpid(child, &status, 0);
+        ASSERT_TRUE(WIFSIGNALED(status));
+    }
+
+    // How many of the names there are.
+    int ExpectWholePictures() const {
+        int found = 0;
+        for (int i = 0; i < 4; ++i) {
+            String const path = Path(i);
+            if (!std::filesystem::exists(path.ToUtf8())) continue;
+            std::unique_ptr<Bitmap> const bitmap(BitmapFactory::CreateBitmapForGraphics(&path));
+            EXPECT_TRUE(bitmap) << path.ToUtf8();
+            if (!bitmap) continue;
+            EXPECT_TRUE((bitmap->GetWidth() == 120 && bitmap->GetHeight() == 80) ||
+                        (bitmap->GetWidth() == 200 && bitmap->GetHeight() == 150));
+            ++found;
+        }
+        return found;
+    }
+    int CountTemporaries() const {
+        int count = 0;
+        for (auto const& entry : std::filesystem::directory_iterator(folder))
+            if (entry.path().extension() == ".tmp") ++count;
+        return count;
+    }
+
+    std::filesystem::path const folder =
+        std::filesystem::temp_directory_path() / ("moka_crash_" + std::to_string(getpid()));
+    Shared* shared = nullptr;
+};
+
+TEST_F(CrashTest, KillingAThousandSavesLeavesOnlyWholePictures) {
+    std::mt19937 random(3);
+    int kills = 0;
+    int interrupted = 0; // saves that left their temporary file, so were in the middle
+    while (shared->saves < kSaves && !HasFailure()) {
+        KillSaver(std::chrono::microseconds(500 + random() % 40000));
+        ++kills;
+        ExpectWholePictures();
+        interrupted += CountTemporaries();
+        for (auto const& entry : std::filesystem::directory_iterator(folder))
+            if (entry.path().extension() == ".tmp") std::filesystem::remove(entry.path());
+    }
+    EXPECT_EQ(ExpectWholePictures(), 4);
+    EXPECT_FALSE(shared->failed);
+    EXPECT_GT(interrupted, 0);
+    RecordProperty("saves", shared->saves);
+    RecordProperty("kills", kills);
+    RecordProperty("interrupted", interrupted);
+}
+
+} // namespace
+} // namespace Moka::Testing

@@ -1,0 +1,144 @@
+// Every file operation of loading and saving fails in turn: the disk is full, broken or forbidden.
+#include "tests/trust/FileFaults.h"
+
+#include "moka/base/Bitmap.h"
+#include "moka/base/BitmapFactory.h"
+#include "moka/base/String.h"
+#include "moka/base/log/AndroidLog.h"
+#include "tests/support/LogCapture.h"
+#include "tests/support/TestImages.h"
+
+#include <cerrno>
+#include <filesystem>
+#include <fstream>
+#include <gtest/gtest.h>
+#include <iterator>
+#include <memory>
+#include <string>
+#include <unistd.h>
+#include <vector>
+
+namespace Moka::Testing {
+namespace {
+
+using Mode = FileFaults::Mode;
+constexpr Mode kFailing[] = {Mode::Fail, Mode::FailAll};
+constexpr int kErrors[] = {ENOSPC, EACCES, EIO};
+
+class FileFault : public ::testing::TestWithParam<char const*> {
+protected:
+    void SetUp() override {
+        mFolder = std::filesystem::temp_directory_path() / ("moka_files_" + std::to_string(getpid()));
+        std::filesystem::create_directories(mFolder);
+        mPath = mFolder / (std::string("picture.") + GetParam());
+    }
+    void TearDown() override { std::filesystem::remove_all(mFolder); }
+
+    bool Save(TestImage const& image) const {
+        Bitmap bitmap;
+        String const path(mPath.string());
+        std::vector<unsigned char> pixels = image.pixels;
+        return bitmap.Construct(pixels.data(), image.width, image.height, image.GetStride(), 1, false,
+                                false) &&
+               BitmapFactory::SaveBitmap(&bitmap, &path, 90);
+    }
+    // Its pixels; nothing when it does not load.
+    std::vector<unsigned char> Load() const {
+        String const path(mPath.string());
+        std::unique_ptr<Bitmap> const bitmap(BitmapFactory::CreateBitmapForGraphics(&path));
+        if (!bitmap) return {};
+        return {bitmap->GetBuffer(), bitmap->GetBuffer() + bitmap->GetStride() * bitmap->GetHeight()};
+    }
+    std::string ReadFile() const {
+        std::ifstream file(mPath, std::ios::binary);
+        return {std::istreambuf_iterator<char>(file), {}};
+    }
+    // The picture, and no temporary file beside it.
+    bool IsAlone() const {
+        auto const files = std::filesystem::directory_iterator(mFolder);
+        return std::distance(begin(files), end(files)) == 1;
+    }
+    template <class Action>
+    static int Disturb(Mode mode, int k, int error, Action const& action) {
+        FileFaults::Arm(mode, k, error);
+        action();
+        return FileFaults::Disarm();
+    }
+
+    // Large enough for several blocks of any codec.
+    TestImage const mOld = MakeChecker(90, 70, 5, {255, 0, 0, 255}, {0, 0, 255, 255});
+    TestImage const mNew = MakeGradient(300, 200);
+    LogCapture mLog;
+
+private:
+    std::filesystem::path mFolder;
+    std::filesystem::path mPath;
+};
+
+TEST_P(FileFault, ASaveShowsTheOldFileOrTheWholeNewOne) {
+    ASSERT_TRUE(Save(mNew));
+    std::string const newBytes = ReadFile();
+    ASSERT_TRUE(Save(mOld));
+    std::string const oldBytes = ReadFile();
+    int const count = Disturb(Mode::Fail, 0, 0, [&] { ASSERT_TRUE(Save(mNew)); });
+    ASSERT_GE(count, 5); // made, written, flushed, closed, renamed
+    int failures = 0;
+    for (Mode const mode : kFailing)
+        for (int const error : kErrors)
+            for (int k = 1; k <= count; ++k) {
+                SCOPED_TRACE(std::to_string(k) + " of " + std::to_string(count) + " error " +
+                             std::to_string(error));
+                ASSERT_TRUE(Save(mOld));
+                mLog.Clear();
+                bool isSaved = false;
+                Disturb(mode, k, error, [&] { isSaved = Save(mNew); });
+                EXPECT_EQ(ReadFile() == newBytes, isSaved);
+                EXPECT_EQ(ReadFile() == oldBytes, !isSaved);
+                EXPECT_EQ(mLog.Count(ANDROID_LOG_ERROR), isSaved ? 0 : 1);
+                EXPECT_TRUE(IsAlone());
+                if (!isSaved) ++failures;
+            }
+    RecordProperty("faults", failures);
+    EXPECT_GE(failures, 5 * 6);
+}
+
+TEST_P(FileFault, ALoadGivesTheWholePictureOrNothing) {
+    ASSERT_TRUE(Save(mNew));
+    std::vector<unsigned char> const pixels = Load();
+    ASSERT_FALSE(pixels.empty());
+    int const count = Disturb(Mode::Fail, 0, 0, [&] { Load(); });
+    int failures = 0;
+    for (Mode const mode : {Mode::Fail, Mode::FailAll, Mode::Truncate})
+        for (int k = 1; k <= count; ++k) {
+            SCOPED_TRACE(std::to_string(k) + " of " + std::to_string(count));
+            mLog.Clear();
+            std::vector<unsigned char> loaded;
+            Disturb(mode, k, EIO, [&] { loaded = Load(); });
+            EXPECT_TRUE(loaded.empty() || loaded == pixels);
+            EXPECT_EQ(mLog.Count(ANDROID_LOG_ERROR), loaded.empty() ? 1 : 0);
+            if (loaded.empty()) ++failures;
+        }
+    RecordProperty("faults", failures);
+    EXPECT_GE(failures, 4);
+    EXPECT_EQ(Load(), pixels);
+}
+
+TEST_P(FileFault, ShortAndInterruptedReadsAndWritesChangeNothing) {
+    ASSERT_TRUE(Save(mNew));
+    std::string const bytes = ReadFile();
+    std::vector<unsigned char> const pixels = Load();
+    ASSERT_TRUE(Save(mOld));
+    bool isSaved = false;
+    Disturb(Mode::Short, 0, 0, [&] { isSaved = Save(mNew); });
+    EXPECT_TRUE(isSaved);
+    EXPECT_EQ(ReadFile(), bytes);
+    std::vector<unsigned char> loaded;
+    Disturb(Mode::Short, 0, 0, [&] { loaded = Load(); });
+    EXPECT_EQ(loaded, pixels);
+}
+
+INSTANTIATE_TEST_SUITE_P(Of, FileFault, ::testing::Values("png", "jpg", "webp", "mki"),
+                         [](auto const& format) { return std::string(format.param); });
+
+} // namespace
+} // namespace Moka::Testing

@@ -1,0 +1,27 @@
+// Scenarios: what callers do with the library, each from nothing to nothing. The sweeps run them with one
+// thing after another failing, so each takes null for an answer.
+#pragma once
+
+#include "moka/graphics/task/IGLMsgQueue.h"
+
+#include <functional>
+#include <string>
+#include <vector>
+
+namespace Moka::Testing {
+
+// The world of a scenario.
+struct Stage {
+    IGLMsgQueue& queue;
+    std::function<void()> settle; // until everything posted so far has run
+    std::string folder;           // for files, without a slash; "picture.png" lies there
+};
+
+struct Scenario {
+    char const* name;
+    void (*run)(Stage const& stage);
+};
+
+std::vector<Scenario> const& GetScenarios();
+
+} // namespace Moka::Testing

@@ -1,0 +1,151 @@
+// Works with the library for as many operations as the argument says, and fails when memory or renderer
+// objects grow after the first fifth.
+#include "tests/trust/Soak.h"
+
+#include "moka/base/RefPtr.h"
+#include "moka/base/log/LogSink.h"
+#include "moka/graphics/drawable/MKBlendedBitmapDrawable.h"
+#include "moka/graphics/drawable/MKGaussianBlurDrawable.h"
+#include "moka/graphics/drawable/MKTextMaskBitmapDrawable.h"
+#include "tests/trust/MixedWork.h"
+
+#include <algorithm>
+#include <cstdint>
+#include <cstdio>
+#include <cstdlib>
+#include <fstream>
+#include <malloc.h>
+#include <string>
+#include <vector>
+
+namespace Moka::Testing {
+namespace {
+
+constexpr std::int64_t kSamples = 100;
+constexpr std::size_t kWarmUp = kSamples / 5;
+constexpr double kMostGrowth = 1024; // bytes for ten thousand operations
+// Pages here and there are the allocator's business. A short run has no time to even out what a driver keeps,
+// which comes and goes by more.
+constexpr double kSlack = 128 * 1024;
+constexpr double kShortSlack = 4096 * 1024;
+constexpr std::int64_t kShort = 500000; // operations
+// What may be queued bounds what the pools of tasks and draws keep, whose growth would be no leak.
+constexpr int kCallsBetweenWaits = 100;
+
+struct Sample {
+    double calls;
+    double bytes; // resident
+    double inUse; // of the heap
+    int objects;
+};
+
+// Without the pages of mapped files, the driver's code among them, which come in as they are first used.
+// What the allocator only keeps for the next time goes back before.
+double GetResidentBytes() {
+    malloc_trim(0);
+    std::ifstream file("/proc/self/status");
+    std::string word;
+    double kilobytes = 0;
+    while (file >> word)
+        if (word == "RssAnon:") file >> kilobytes;
+    return kilobytes * 1024;
+}
+
+// Works until calls have been made, never far ahead of the render thread.
+void WorkUntil(MixedWork& work, IGLMsgQueue& queue, std::int64_t calls) {
+    std::int64_t nextWait = work.CountCalls() + kCallsBetweenWaits;
+    while (work.CountCalls() < calls) {
+        work.Step();
+        if (work.CountCalls() < nextWait) continue;
+        queue.WaitForTasks();
+        nextWait = work.CountCalls() + kCallsBetweenWaits;
+    }
+}
+
+// What a task drops for good is deleted by a task that it posts, which may drop more.
+void AwaitIdle(IGLMsgQueue& queue) {
+    constexpr int kDeepest = 8;
+    for (int i = 0; i < kDeepest; ++i) queue.WaitForTasks();
+}
+
+// Bytes for each call, by least squares.
+double GetSlope(std::vector<Sample> const& samples, double Sample::*value) {
+    double n = 0, x = 0, y = 0, xx = 0, xy = 0;
+    for (std::size_t i = kWarmUp; i < samples.size(); ++i) {
+        n += 1;
+        x += samples[i].calls;
+        y += samples[i].*value;
+        xx += samples[i].calls * samples[i].calls;
+        xy += samples[i].calls * samples[i].*value;
+    }
+    return (n * xy - x * y) / (n * xx - x * x);
+}
+
+// Uses every program for as long as it lives. Without it they are compiled anew again and again, and what
+// grows is the driver's caches of them.
+class ProgramsInUse {
+public:
+    explicit ProgramsInUse(IGLMsgQueue& queue)
+        : mWork(queue, 2, nullptr),
+          mBlur(Made::Adopt(new MKGaussianBlurDrawable(&queue))),
+          mMask(Made::Adopt(new MKTextMaskBitmapDrawable(&queue))),
+          mBlend(Made::Adopt(new MKBlendedBitmapDrawable(&queue, nullptr, nullptr, RectF(), RectF(), 0, 0))) {
+        constexpr int kSteps = 100; // enough for its canvases to have drawn everything
+        for (int i = 0; i < kSteps; ++i) mWork.Step();
+    }
+
+private:
+    using Made = RefPtr<IMKCustomDrawable>;
+
+    MixedWork mWork;
+    Made mBlur;
+    Made mMask;
+    Made mBlend;
+};
+
+// The renderer may keep a copy of a target for the next time, or not.
+int GetMostObjects(std::vector<Sample> const& samples, std::size_t count) {
+    int most = 0;
+    for (std::size_t i = 0; i < count; ++i) most = std::max(most, samples[i].objects);
+    return most;
+}
+
+int Soak(std::int64_t operations) {
+    SetLogSink([](LogLine const&) {});
+    std::unique_ptr<IGLMsgQueue> const queue = StartRenderThread();
+    if (!queue) return 1;
+    ProgramsInUse const programs(*queue);
+    MixedWork work(*queue, 1, nullptr);
+    std::vector<Sample> samples;
+    samples.reserve(kSamples);
+    for (std::int64_t i = 1; i <= kSamples; ++i) {
+        WorkUntil(work, *queue, operations * i / kSamples);
+        work.DropAll();
+        AwaitIdle(*queue);
+        samples.push_back({static_cast<double>(work.CountCalls()), GetResidentBytes(),
+                           static_cast<double>(mallinfo2().uordblks), CountRendererObjects()});
+    }
+    double const slope = GetSlope(samples, &Sample::bytes) * 10000;
+    double const heapSlope = GetSlope(samples, &Sample::inUse) * 10000;
+    int const objects = GetMostObjects(samples, kWarmUp);
+    std::printf("operations %lld\nresident %.0f KB after warm-up, %.0f KB at the end\n"
+                "growth for 10,000 operations: resident %.1f bytes, heap in use %.1f bytes\n"
+                "renderer objects at most %d in the warm-up, %d at the end\n",
+                static_cast<long long>(work.CountCalls()), samples[kWarmUp].bytes / 1024,
+                samples.back().bytes / 1024, slope, heapSlope, objects, samples.back().objects);
+    double const slack = operations < kShort ? kShortSlack : kSlack;
+    bool const isFlat = slope < kMostGrowth || samples.back().bytes - samples[kWarmUp].bytes < slack;
+    return isFlat && samples.back().objects <= objects ? 0 : 1;
+}
+
+} // namespace
+} // namespace Moka::Testing
+
+int main(int argc, char** argv) {
+    long long const operations = argc > 1 ? std::atoll(argv[1]) : 0;
+    if (operations < 1000) {
+        std::fprintf(stderr, "usage: %s OPERATIONS (1000 or more)\n", argv[0]);
+        return 2;
+    }
+    return Moka::Testing::Soak(operations);
+}

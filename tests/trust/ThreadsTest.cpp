@@ -1,0 +1,94 @@
+// Four callers, the render thread and the loader at once. Meant for the thread sanitizer.
+#include "moka/base/Bitmap.h"
+#include "moka/base/BitmapFactory.h"
+#include "moka/base/String.h"
+#include "moka/graphics/bitmap/ImageDecoding.h"
+#include "moka/graphics/bitmap/MKGraphicsFactory.h"
+#include "moka/graphics/loader/MKBitmapLoader.h"
+#include "moka/host/TaskQueue.h"
+#include "moka/renderer/RendererFactory.h"
+#include "tests/support/LogCapture.h"
+#include "tests/support/RecordingRenderer.h"
+#include "tests/support/TestImages.h"
+#include "tests/trust/MixedWork.h"
+#include "tests/trust/RecordingThread.h"
+
+#include <atomic>
+#include <filesystem>
+#include <gtest/gtest.h>
+#include <string>
+#include <thread>
+#include <unistd.h>
+#include <vector>
+
+namespace Moka::Testing {
+namespace {
+
+constexpr int kSteps = 1500;
+constexpr int kLoads = 150;
+
+class ThreadsTest : public ::testing::Test {
+protected:
+    void SetUp() override {
+        MKBitmapFactory_UseNativeDecoder();
+        std::filesystem::create_directories(folder);
+        TestImage image = MakeGradient(5, 4);
+        Bitmap picture;
+        ASSERT_TRUE(picture.Construct(image.pixels.data(), 5, 4, 20, 1, false, false));
+        ASSERT_TRUE(BitmapFactory::SaveBitmap(&picture, &path, 100));
+        ASSERT_TRUE(MKBitmapLoader::startEventLoopBySelf());
+    }
+    void TearDown() override { std::filesystem::remove_all(folder); }
+
+    // Loads a picture again and again, draws each onto a bitmap of its own on the loader's thread, and saves
+    // the bitmap.
+    void LoadDrawAndSave(IGLMsgQueue& queue) {
+        auto const target = RefPtr<IMKBitmap>::Adopt(MKGraphicsFactory::CreateBitmap(
+            &queue, MixedWork::kSide, MixedWork::kHeight, nullptr, false, 1, false));
+        auto const canvas =
+            RefPtr<IMKCanvas>::Adopt(MKGraphicsFactory::CreateCanvas(&queue, target.Get(), 1));
+        MKBitmapLoader::Callback callback;
+        callback.onLoad = [&](int, String const&, IMKBitmap& loaded) {
+            canvas->DrawBitmap(&loaded, 0, 0, nullptr);
+            ++called;
+        };
+        callback.onSave = [&](int, String const&, void*) { ++called; };
+        MKBitmapLoader loader(nullptr, &callback);
+        for (int id = 0; id < kLoads; ++id) {
+            EXPECT_TRUE(loader.RequestLoad(id, path, &queue));
+            EXPECT_TRUE(loader.RequestSave(id, savePath, *target, nullptr, 100));
+        }
+        while (called < 2 * kLoads) std::this_thread::yield();
+        loader.WaitForCallback();
+    }
+
+    std::filesystem::path const folder =
+        std::filesystem::temp_directory_path() / ("moka_threads_" + std::to_string(getpid()));
+    String const path{(folder / "a.mki").string()};
+    String const savePath{(folder / "b.mki").string()};
+    std::atomic<int> called{0};
+    LogCapture log;
+};
+
+TEST_F(ThreadsTest, RandomCallersAndTheLoaderShareOneRenderThread) {
+    {
+        RecordingThread queue(MixedWork::kSide);
+        auto const shared = RefPtr<IMKBitmap>::Adopt(MKGraphicsFactory::CreateBitmap(
+            &queue, MixedWork::kSide, MixedWork::kHeight, nullptr, false, 1, false));
+        std::vector<std::thread> threads;
+        for (unsigned seed = 0; seed < 4; ++seed)
+            threads.emplace_back([&, seed] {
+                MixedWork work(queue, seed, shared.Get());
+                for (int i = 0; i < kSteps; ++i) work.Step();
+            });
+        threads.emplace_back([&] { LoadDrawAndSave(queue); });
+        for (std::thread& thread : threads) thread.join();
+        MKBitmapLoader::WaitForAllSaveRequestsToEnd(&queue);
+    }
+    EXPECT_EQ(called, 2 * kLoads);
+    EXPECT_EQ(RecordingRenderer::CountLiveObjects(), 0);
+    EXPECT_TRUE(RecordingRenderer::GetViolations().empty());
+}
+
+} // namespace
+} // namespace Moka::Testing

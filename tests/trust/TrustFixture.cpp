@@ -1,0 +1,149 @@
+#include "tests/trust/TrustFixture.h"
+
+#include "moka/base/Bitmap.h"
+#include "moka/base/BitmapFactory.h"
+#include "moka/base/String.h"
+#include "moka/graphics/bitmap/ImageDecoding.h"
+#include "moka/graphics/drawable/ShaderManager.h"
+#include "moka/graphics/drawable/Shaders.h"
+#include "moka/renderer/RendererFactory.h"
+#include "tests/support/RecordingRenderer.h"
+#include "tests/support/TestImages.h"
+
+#include <exception>
+#include <map>
+#include <sstream>
+#include <typeinfo>
+#include <unistd.h>
+
+namespace Moka::Testing {
+namespace {
+
+class FrameText {
+public:
+    std::string Describe(RecordedEvent const& event) {
+        if (auto const* const draw = std::get_if<RecordedDraw>(&event)) return Describe(*draw);
+        return Describe(std::get<RecordedClear>(event));
+    }
+
+private:
+    // "target 17" as the first target that appears: "target #0".
+    std::string Name(std::string const& object) {
+        std::string const kind = object.substr(0, object.find(' '));
+        auto& known = mNames[kind];
+        auto const at = known.emplace(object, known.size()).first;
+        return kind + " #" + std::to_string(at->second);
+    }
+
+    void AddScissor(std::ostringstream& text, PipelineState const& state) {
+        if (!state.scissorOn) return;
+        text << " scissor " << state.scissor.x << ' ' << state.scissor.y << ' ' << state.scissor.width << ' '
+             << state.scissor.height;
+    }
+
+    std::string Describe(RecordedDraw const& draw) {
+        std::ostringstream text;
+        text << draw.shader << " into " << Name(draw.target) << " with " << Name(draw.buffer) << " count "
+             << draw.count;
+        auto const& blend = draw.state.blend;
+        auto const& stencil = draw.state.depthStencil;
+        text << " blend " << blend.IsBlending() << blend.IsColorWrite() << ' '
+             << static_cast<int>(blend.GetColorEquation().source) << ' '
+             << static_cast<int>(blend.GetColorEquation().destination) << " stencil "
+             << draw.state.stencilClip << ' ' << stencil.GetComparison() << ' ' << stencil.GetReference()
+             << ' ' << stencil.GetPass();
+        AddScissor(text, draw.state);
+        for (float const number : draw.vertices) text << ' ' << number;
+        for (auto const& [name, value] : draw.uniforms) text << ' ' << name << '=' << value.text;
+        // Only what a sampler reads: another unit may still hold what an earlier run left.
+        for (auto const& [name, value] : draw.uniforms)
+            if (name.find("Texture") != std::string::npos && value.numbers.size() == 1)
+                if (auto const at = draw.textures.find(static_cast<int>(value.numbers[0]));
+                    at != draw.textures.end())
+                    text << " unit " << at->first << ' ' << Name(at->second);
+        return text.str();
+    }
+
+    std::string Describe(RecordedClear const& clear) {
+        std::ostringstream text;
+        text << "clear of " << Name(clear.target);
+        AddScissor(text, clear.state);
+        if (clear.clearsColor)
+            for (float const component : clear.color) text << ' ' << component;
+        if (clear.clearsStencil) text << " stencil " << clear.stencil << " of " << Name(clear.buffer);
+        return text.str();
+    }
+
+    std::map<std::string, std::map<std::string, std::size_t>> mNames;
+};
+
+void WritePicture(std::filesystem::path const& path) {
+    TestImage image = MakeAlphaPattern(20, 90);
+    Bitmap bitmap;
+    String const name(path.string());
+    ASSERT_TRUE(bitmap.Construct(image.pixels.data(), 20, 90, image.GetStride(), 1, false, false));
+    ASSERT_TRUE(BitmapFactory::SaveBitmap(&bitmap, &name, 100));
+}
+
+template <class... Shaders>
+void Forget() {
+    (ShaderManager::GetInstance()->RemoveShader(ShaderManager::Key(typeid(Shaders).name())), ...);
+}
+
+} // namespace
+
+void SurvivingQueue::Settle() {
+    for (;;) {
+        try {
+            RunAll();
+            return;
+        } catch (std::exception const&) {
+        }
+    }
+}
+
+void TrustFixture::SetUp() {
+    MKBitmapFactory_UseNativeDecoder();
+    folder = std::filesystem::temp_directory_path() / ("moka_trust_" + std::to_string(getpid()));
+    std::filesystem::create_directories(folder);
+    WritePicture(folder / "picture.png");
+    RecordingRenderer::Reset();
+    RecordingRenderer::SetMaxTextureSize(kMaxSide);
+    ASSERT_TRUE(RendererFactory::AttachContext());
+    RecordingRenderer::DeclareNoRenderThread();
+    queue.SetAroundRun([] { RecordingRenderer::DeclareRenderThread(); },
+                       [] { RecordingRenderer::DeclareNoRenderThread(); });
+    RunScenario(); // whatever is made once and kept is made now
+}
+
+void TrustFixture::TearDown() {
+    for (std::string const& violation : RecordingRenderer::GetViolations()) ADD_FAILURE() << violation;
+    ForgetShaders(); // those that a leaked drawable holds die with the renderer's next reset
+    RecordingRenderer::DeclareRenderThread();
+    RendererFactory::DetachContext();
+    std::filesystem::remove_all(folder);
+}
+
+void TrustFixture::ForgetShaders() {
+    Forget<MKRectShader, MKLineShader, MKCircleShader, MKRoundRectShader, MKRoundRectRoundShader,
+           MKBitmapShader, MKBitmapShaderColorClamp, MKBitmapAdvancedBlendingShader, MKBlenderBitmapsShader,
+           MKGaussianBlurShader, MKNonPremultipliedColorShader, MKTextMaskBitmapShader>();
+}
+
+void TrustFixture::RunScenario() {
+    GetParam().run({queue, [this] { queue.Settle(); }, folder.string()});
+    queue.Settle();
+    mLog.Clear();
+}
+
+std::vector<std::string> TrustFixture::TakeFrame() {
+    RecordingRenderer::TakeEvents();
+    RunScenario();
+    FrameText text;
+    std::vector<std::string> frame;
+    for (RecordedEvent const& event : RecordingRenderer::TakeEvents()) frame.push_back(text.Describe(event));
+    RecordingRenderer::TakeCalls();
+    return frame;
+}
+
+} // namespace Moka::Testing

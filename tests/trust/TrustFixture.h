@@ -1,0 +1,49 @@
+// TrustFixture: scenarios over the recording renderer, on one thread that stands for both sides. Programs
+// are counted with the other objects, so a run that balances leaves nothing alive at all.
+#pragma once
+
+#include "tests/support/LogCapture.h"
+#include "tests/support/Queues.h"
+#include "tests/trust/Scenarios.h"
+
+#include <filesystem>
+#include <gtest/gtest.h>
+#include <string>
+#include <vector>
+
+namespace Moka::Testing {
+
+// Goes on after a task that threw, as a render thread does.
+class SurvivingQueue final : public HandPumpedQueue {
+public:
+    void WaitForTasks() override { Settle(); }
+    void Settle();
+};
+
+inline std::string NameOfScenario(::testing::TestParamInfo<Scenario> const& scenario) {
+    return scenario.param.name;
+}
+
+class TrustFixture : public ::testing::TestWithParam<Scenario> {
+protected:
+    static constexpr int kMaxSide = 64;
+
+    void SetUp() override;
+    void TearDown() override;
+
+    // To its end, and until nothing is posted any more.
+    void RunScenario();
+    // The same, undisturbed; what it drew and cleared, with objects named in the order of their appearance,
+    // so that two runs compare.
+    std::vector<std::string> TakeFrame();
+    // The shader manager forgets what it has.
+    static void ForgetShaders();
+
+    SurvivingQueue queue;
+    std::filesystem::path folder;
+
+private:
+    LogCapture mLog; // keeps the expected error lines off the terminal
+};
+
+} // namespace Moka::Testing
