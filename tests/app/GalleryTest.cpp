@@ -2,7 +2,6 @@
 #include "tests/app/ToolTest.h"
 #include "tests/support/ImageCompare.h"
 
-#include <regex>
 #include <set>
 #include <sstream>
 
@@ -17,10 +16,12 @@ class GalleryTest : public ToolTest {
 protected:
     // Everything that a page refers to by this attribute.
     static std::multiset<std::string> FindAll(std::string const& page, std::string const& attribute) {
-        std::regex const pattern(attribute + "=\"([^\"]*)\"");
+        std::string const start = attribute + "=\"";
         std::multiset<std::string> found;
-        for (std::sregex_iterator at(page.begin(), page.end(), pattern), end; at != end; ++at)
-            found.insert((*at)[1]);
+        for (std::size_t at = page.find(start); at != std::string::npos; at = page.find(start, at)) {
+            at += start.size();
+            found.insert(page.substr(at, page.find('"', at) - at));
+        }
         return found;
     }
 };
