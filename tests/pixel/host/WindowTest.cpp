@@ -41,6 +41,9 @@ TEST_F(WindowTest, WhatIsDrawnOnAScreenBitmapIsShownWhenPresented) {
     std::string error;
     std::unique_ptr<RenderThread> const thread = RenderThread::Start(options, &error);
     ASSERT_TRUE(thread) << error;
+    if (thread->GetContextInfo().renderer.find("ANGLE") != std::string::npos) {
+        GTEST_SKIP() << "the ANGLE that the tests fetch is built without a window system";
+    }
     EXPECT_NE(thread->GetContextInfo().path.find("window"), std::string::npos);
     IMKBitmap* const screen =
         MKGraphicsFactory::CreateScreenBitmap(thread.get(), 0, 0, kWidth, kHeight, 1, 1);
