@@ -47,10 +47,11 @@ char LevelOf(int priority) {
 std::string Format(char const* format, va_list arguments) {
     va_list again;
     va_copy(again, arguments);
+    // NOLINTBEGIN(clang-analyzer-valist.Uninitialized): both are, by the caller and by va_copy
     int const length = std::vsnprintf(nullptr, 0, format, arguments);
     std::string text(length > 0 ? static_cast<std::size_t>(length) : 0, '\0');
-    // NOLINTNEXTLINE(clang-analyzer-valist.Uninitialized): it is, by va_copy
     if (length > 0) std::vsnprintf(text.data(), text.size() + 1, format, again);
+    // NOLINTEND(clang-analyzer-valist.Uninitialized)
     va_end(again);
     return text;
 }
