@@ -1,0 +1,132 @@
+// DrawFixture: a target, programs of one colour and of one texture, and the states to draw under; immediate
+// and deferred, because the pixels are the same.
+#pragma once
+
+#include "tests/pixel/renderer/RendererFixture.h"
+
+#include "moka/renderer/IBlendStateObject.h"
+#include "moka/renderer/IDepthStencilState.h"
+#include "moka/renderer/IGraphicsObject.h"
+#include "moka/renderer/IParameterBinding.h"
+#include "moka/renderer/IRasterizerState.h"
+#include "moka/renderer/IShaderProgram.h"
+
+#include <array>
+#include <memory>
+#include <string>
+
+namespace Moka::Testing {
+
+using ProgramPtr = std::unique_ptr<IShaderProgram, Releaser>;
+using ParameterPtr = std::unique_ptr<IParameterBinding>;
+using GraphicsPtr = std::unique_ptr<IGraphicsObject, Releaser>;
+using BlendPtr = std::unique_ptr<IBlendStateObject, Releaser>;
+using StatePtr = std::unique_ptr<IDepthStencilState, Releaser>;
+
+inline constexpr int kSize = 8;
+
+// Positions are pixels of a target of kSize; texture coordinates follow them.
+inline constexpr char kVertex[] = "attribute vec2 corner; varying highp vec2 at;\n"
+                                  "void main() { at = corner / 8.0;\n"
+                                  "  gl_Position = vec4(at * 2.0 - 1.0, 0.0, 1.0); }";
+inline constexpr char kColored[] = "precision highp float; uniform vec4 color;\n"
+                                   "void main() { gl_FragColor = color; }";
+inline constexpr char kTextured[] = "precision highp float; uniform sampler2D texel; varying vec2 at;\n"
+                                    "void main() { gl_FragColor = texture2D(texel, at); }";
+
+// A program with its one parameter.
+struct Brush {
+    Brush(char const* fragment, char const* parameterName)
+        : program(RendererFactory::CreateShaderProgram(kVertex, fragment, "brush")),
+          parameter(program->GetParameter(parameterName)) {}
+
+    ProgramPtr program;
+    ParameterPtr parameter;
+};
+
+class DrawFixture : public RendererFixture, public ::testing::WithParamInterface<bool> {
+protected:
+    void SetUp() override {
+        RendererFixture::SetUp();
+        Begin();
+    }
+    void TearDown() override {
+        End();
+        RendererFixture::TearDown();
+    }
+
+    void Begin() {
+        RendererFactory::SetDeferred(GetParam());
+        texture = MakeTexture(kSize, kSize);
+        target = MakeTarget(*texture);
+        colored = std::make_unique<Brush>(kColored, "color");
+        textured = std::make_unique<Brush>(kTextured, "texel");
+        VertexDescriptor layout;
+        layout.addAttribute(VertexAttributeType::Float, 2, -1, 0);
+        quad.reset(RendererFactory::CreateGraphicsObject(1, PrimitiveType::TriangleList, &layout, 0, 0));
+        blend.reset(RendererFactory::CreateBlendStateObject(BlendStateDescriptor(true)));
+        stencil.reset(RendererFactory::CreateDepthStencilState(DepthStencilStateDescriptor(false, false)));
+        blend->Apply();
+        stencil->Apply();
+    }
+
+    void End() {
+        quad.reset();
+        blend.reset();
+        stencil.reset();
+        colored.reset();
+        textured.reset();
+        target.reset();
+        texture.reset();
+    }
+
+    void SetQuad(float l, float t, float r, float b) const {
+        float const corners[] = {l, t, l, b, r, t, r, t, l, b, r, b};
+        quad->SetVertices(0, corners, 6);
+    }
+    void Fill(Pixel color, float l, float t, float r, float b) const {
+        std::array<float, 4> const value{static_cast<float>(color.r) / 255, static_cast<float>(color.g) / 255,
+                                         static_cast<float>(color.b) / 255,
+                                         static_cast<float>(color.a) / 255};
+        colored->program->MakeCurrent();
+        colored->parameter->Set(value.data());
+        SetQuad(l, t, r, b);
+        EXPECT_TRUE(quad->Draw(0, -1, 1));
+    }
+    void Paint(ITextureObject& source, float l, float t, float r, float b) const {
+        int const unit = 1;
+        source.Bind(unit);
+        textured->program->MakeCurrent();
+        textured->parameter->Set(&unit);
+        SetQuad(l, t, r, b);
+        EXPECT_TRUE(quad->Draw(0, -1, 1));
+    }
+    void SetStencil(StencilComparison comparison, int reference, StencilOperation pass) const {
+        DepthStencilStateDescriptor descriptor(false, true);
+        descriptor.SetStencilFunction(comparison, reference, 0xFF, 0xFF);
+        descriptor.SetStencilOperation(StencilKeep, StencilKeep, pass);
+        stencil->SetDescriptor(descriptor);
+        stencil->Apply();
+    }
+    Image Read() { return RendererFixture::Read(*target, kSize, kSize); }
+    static Image Filled(Pixel color) { return Image(kSize, kSize, color); }
+    static Image With(Image image, Pixel color, int x, int y, int w, int h) {
+        return image.With(x, y, Image(w, h, color), 0, 0, w, h);
+    }
+    static RendererStatistics Count() { return RendererFactory::GetStatistics(); }
+    static bool IsDeferred() { return GetParam(); }
+
+    TexturePtr texture;
+    TargetPtr target;
+    std::unique_ptr<Brush> colored;
+    std::unique_ptr<Brush> textured;
+    GraphicsPtr quad;
+    BlendPtr blend;
+    StatePtr stencil;
+};
+
+inline std::string GetDrawMode(::testing::TestParamInfo<bool> const& mode) {
+    return mode.param ? "Deferred" : "Immediate";
+}
+
+} // namespace Moka::Testing
