@@ -1,21 +1,8 @@
 #include "moka/graphics/canvas/MKPenCanvasImpl.h"
 
-#include "moka/graphics/drawable/RendererPtr.h"
-#include "moka/renderer/IBlendStateObject.h"
 #include "moka/renderer/RendererFactory.h"
 
 namespace Moka {
-namespace {
-
-// Foreign code may have left them off, and a commit keeps what nobody has set.
-void SwitchColorWritesOn() {
-    BlendStateDescriptor descriptor(false);
-    descriptor.SetEnabled(false, true);
-    detail::RendererPtr<IBlendStateObject> const state(RendererFactory::CreateBlendStateObject(descriptor));
-    if (state) state->Apply();
-}
-
-} // namespace
 
 MKPenCanvasImpl::MKPenCanvasImpl(IGLMsgQueue* queue, IMKBitmap* bitmap, bool onRenderThread)
     : MKCanvasImplBase(queue, bitmap, onRenderThread) {}
@@ -25,6 +12,16 @@ MKPenCanvasImpl::~MKPenCanvasImpl() = default;
 Matrix4<float> MKPenCanvasImpl::GetCanvasMatrix() const {
     IMKBitmapWritable* const writable = GetBitmap()->GetBitmapWritable();
     return writable ? writable->GetProjectionMatrix() : Matrix4<float>();
+}
+
+// Foreign code may have left them off, and a commit keeps what nobody has set.
+void MKPenCanvasImpl::SwitchColorWritesOn() {
+    if (!mColorWrites) {
+        BlendStateDescriptor descriptor(false);
+        descriptor.SetEnabled(false, true);
+        mColorWrites.reset(RendererFactory::CreateBlendStateObject(descriptor));
+    }
+    if (mColorWrites) mColorWrites->Apply();
 }
 
 void MKPenCanvasImpl::EnableClipRT(int) {

@@ -3,7 +3,9 @@
 #pragma once
 
 #include "moka/graphics/canvas/MKCanvasImplBase.h"
+#include "moka/graphics/drawable/RendererPtr.h"
 #include "moka/graphics/math/Matrix4.h"
+#include "moka/renderer/IBlendStateObject.h"
 
 namespace Moka {
 
@@ -18,6 +20,11 @@ public:
     // A pen canvas draws into the bitmap as one frame buffer, whatever the index. Relied upon.
     void EnableClipRT(int frameBuffer);
     void DisableClipRT();
+
+private:
+    void SwitchColorWritesOn();
+
+    detail::RendererPtr<IBlendStateObject> mColorWrites; // made by the first enable
 };
 
 } // namespace Moka
