@@ -11,43 +11,43 @@ namespace Moka::Scenes {
 namespace {
 
 struct Entry {
-    SceneGroup group;
     char const* name; // of a file in data
+    SceneGroup group;
     bool alsoInStrips = false;
 };
 
 // In the gallery's order.
 constexpr Entry kEntries[] = {
-    {SceneGroup::Rectangles, "rect-styles"},
-    {SceneGroup::Rectangles, "rect-widths"},
-    {SceneGroup::Rectangles, "rect-fractions"},
-    {SceneGroup::Rectangles, "rect-matrices"},
-    {SceneGroup::TransferModes, "modes-rectangles"},
-    {SceneGroup::TransferModes, "modes-bitmaps"},
-    {SceneGroup::Clips, "clips", true},
-    {SceneGroup::Clips, "clip-primitives", true},
-    {SceneGroup::Clips, "clip-combinations"},
-    {SceneGroup::Clips, "clip-clear"},
-    {SceneGroup::SaveAndRestore, "save-restore"},
-    {SceneGroup::SaveAndRestore, "save-flags"},
-    {SceneGroup::Bitmaps, "bitmap-whole"},
-    {SceneGroup::Bitmaps, "bitmap-parts"},
-    {SceneGroup::Bitmaps, "bitmap-turned"},
-    {SceneGroup::Bitmaps, "bitmap-tiles"},
-    {SceneGroup::Bitmaps, "bitmap-tall", true},
-    {SceneGroup::Bitmaps, "bitmap-batch"},
-    {SceneGroup::Bitmaps, "bitmap-darken-lighten"},
-    {SceneGroup::Lines, "line-caps"},
-    {SceneGroup::Lines, "line-dashes"},
-    {SceneGroup::Lines, "line-fan"},
-    {SceneGroup::Lines, "simple-lines"},
-    {SceneGroup::Circles, "circle-styles"},
-    {SceneGroup::Circles, "circle-sizes"},
-    {SceneGroup::Circles, "circle-matrices"},
-    {SceneGroup::RoundRectangles, "round-rect-styles"},
-    {SceneGroup::RoundRectangles, "round-rect-radii"},
-    {SceneGroup::RoundRectangles, "round-rect-matrices"},
-    {SceneGroup::Screen, "screen"},
+    {"rect-styles", SceneGroup::Rectangles},
+    {"rect-widths", SceneGroup::Rectangles},
+    {"rect-fractions", SceneGroup::Rectangles},
+    {"rect-matrices", SceneGroup::Rectangles},
+    {"modes-rectangles", SceneGroup::TransferModes},
+    {"modes-bitmaps", SceneGroup::TransferModes},
+    {"clips", SceneGroup::Clips, true},
+    {"clip-primitives", SceneGroup::Clips, true},
+    {"clip-combinations", SceneGroup::Clips},
+    {"clip-clear", SceneGroup::Clips},
+    {"save-restore", SceneGroup::SaveAndRestore},
+    {"save-flags", SceneGroup::SaveAndRestore},
+    {"bitmap-whole", SceneGroup::Bitmaps},
+    {"bitmap-parts", SceneGroup::Bitmaps},
+    {"bitmap-turned", SceneGroup::Bitmaps},
+    {"bitmap-tiles", SceneGroup::Bitmaps},
+    {"bitmap-tall", SceneGroup::Bitmaps, true},
+    {"bitmap-batch", SceneGroup::Bitmaps},
+    {"bitmap-darken-lighten", SceneGroup::Bitmaps},
+    {"line-caps", SceneGroup::Lines},
+    {"line-dashes", SceneGroup::Lines},
+    {"line-fan", SceneGroup::Lines},
+    {"simple-lines", SceneGroup::Lines},
+    {"circle-styles", SceneGroup::Circles},
+    {"circle-sizes", SceneGroup::Circles},
+    {"circle-matrices", SceneGroup::Circles},
+    {"round-rect-styles", SceneGroup::RoundRectangles},
+    {"round-rect-radii", SceneGroup::RoundRectangles},
+    {"round-rect-matrices", SceneGroup::RoundRectangles},
+    {"screen", SceneGroup::Screen},
 };
 
 Scene ReadEntry(Entry const& entry) {

@@ -123,9 +123,10 @@ struct PenStroke::GlInk {
         glBufferData(GL_ARRAY_BUFFER, static_cast<GLsizeiptr>(strip.size() * sizeof(Vertex)), strip.data(),
                      GL_STREAM_DRAW);
         for (GLuint i = 0; i < 2; ++i) {
+            std::uintptr_t const offset = std::uintptr_t{i} * 2 * sizeof(float);
             glEnableVertexAttribArray(i);
             glVertexAttribPointer(i, 2, GL_FLOAT, GL_FALSE, sizeof(Vertex),
-                                  reinterpret_cast<void const*>(i * 2 * sizeof(float)));
+                                  reinterpret_cast<void const*>(offset));
         }
         glEnable(GL_BLEND);
         glBlendEquation(GL_FUNC_ADD);

@@ -17,7 +17,7 @@ std::unique_ptr<Bitmap> Load(std::string const& path) {
 }
 
 unsigned char const* PixelAt(Bitmap const& image, int x, int y) {
-    return image.GetBuffer() + static_cast<std::ptrdiff_t>(image.GetStride()) * y + 4 * x;
+    return image.GetBuffer() + static_cast<std::ptrdiff_t>(image.GetStride()) * y + std::ptrdiff_t{4} * x;
 }
 
 } // namespace

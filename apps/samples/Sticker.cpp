@@ -52,7 +52,7 @@ void LayFace(Color& color, Spot p) {
         Lay(color, dark, Cover(Oval(p, {x, 392}, 15, 19)));
         Lay(color, FromHex(0xFFFFFF), Cover(Oval(p, {x + 5, 385}, 5, 6)));
         Lay(color, FromHex(0xFF8FA3, 0.75f),
-            Smooth(6, -16, Oval(p, {x + (x < 290 ? -26 : 26), 428}, 24, 15)));
+            Smooth(6, -16, Oval(p, {x + (x < 290 ? -26.0f : 26.0f), 428}, 24, 15)));
     }
     float const smile = std::max(Ring(p, {290, 412}, 27, 9), 420 - p.y);
     Lay(color, dark, Cover(smile));

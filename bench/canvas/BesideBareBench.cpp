@@ -75,6 +75,7 @@ void Batch(benchmark::State& state) {
     RefPtr<IMKBitmap> const bitmap = MakeBitmap(kSize, kSize);
     OnRenderThread<BareQuads> bare(kSize);
     std::vector<RectF> dsts;
+    dsts.reserve(kShapes);
     for (int i = 0; i < kShapes; ++i) dsts.push_back(BoxOf(i, kSize));
     MKPaint const paint;
     Compare(

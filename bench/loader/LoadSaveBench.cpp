@@ -113,7 +113,7 @@ void RunPipeline(Pictures const& pictures) {
     for (int i = 0; i < kPictures; ++i) {
         auto const bitmap =
             RefPtr<IMKBitmap>::Adopt(MKGraphicsFactory::CreateBitmap(&Queue(), &pictures.GetInput(i), 1));
-        std::unique_ptr<unsigned char[]> const pixels(new unsigned char[kSide * kSide * 4]);
+        std::unique_ptr<unsigned char[]> const pixels(new unsigned char[std::size_t{kSide} * kSide * 4]);
         bitmap->GetBitmapData(bitmap->GetBitmapRect(), pixels.get());
         Bitmap copy;
         copy.Construct(pixels.get(), kSide, kSide, kSide * 4, 1, false, false);

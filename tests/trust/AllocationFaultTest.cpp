@@ -11,7 +11,7 @@
 namespace Moka::Testing {
 namespace {
 
-class AllocationFaults : public TrustFixture {
+class FaultSweep : public TrustFixture {
 protected:
     // Runs the scenario with the k-th allocation failing, for each k that there is and one more.
     template <class Check>
@@ -35,6 +35,8 @@ protected:
     }
 };
 
+class AllocationFaults : public FaultSweep {};
+
 TEST_P(AllocationFaults, AnObjectThatCannotBeMadeLeavesNothingBehind) {
     int const alive = RecordingRenderer::CountLiveObjects();
     auto const objects = Faults::CountLive(Faults::Kind::Objects);
@@ -47,10 +49,25 @@ TEST_P(AllocationFaults, AnObjectThatCannotBeMadeLeavesNothingBehind) {
     });
 }
 
+// The copies of what the caller gave, and the loader's books: a call that lacks memory for them did not happen, or
+// throws.
+TEST_P(AllocationFaults, ACallWithoutMemoryForItsCopiesLeavesNothingBehind) {
+    int const alive = RecordingRenderer::CountLiveObjects();
+    auto const objects = Faults::CountLive(Faults::Kind::Objects);
+    auto const tasks = Faults::CountLive(Faults::Kind::Tasks);
+    Sweep(Faults::Kind::Throwing, [&](bool) {
+        EXPECT_EQ(RecordingRenderer::CountLiveObjects(), alive);
+        EXPECT_EQ(Faults::CountLive(Faults::Kind::Objects), objects);
+        EXPECT_EQ(Faults::CountLive(Faults::Kind::Tasks), tasks);
+    });
+}
+
+class RequestFaults : public FaultSweep {};
+
 // A request that cannot be made is one that the queue refused: what it would have acted on, given back or
 // deleted may stay for good. So what stays is only looked at where every request was made; which leaks belong
 // to which refusal, RefusingQueueTest knows.
-TEST_P(AllocationFaults, ARequestThatCannotBeMadeIsARefusedOne) {
+TEST_P(RequestFaults, ARequestThatCannotBeMadeIsARefusedOne) {
     auto const tasks = Faults::CountLive(Faults::Kind::Tasks);
     Sweep(Faults::Kind::Tasks, [&](bool failed) {
         EXPECT_EQ(Faults::CountLive(Faults::Kind::Tasks), tasks);
@@ -94,6 +111,9 @@ TEST(ThrowingAllocationFaults, ALevelOrAClipThatDoesNotFitIsDropped) {
 }
 
 INSTANTIATE_TEST_SUITE_P(Of, AllocationFaults, ::testing::ValuesIn(GetScenarios()), NameOfScenario);
+INSTANTIATE_TEST_SUITE_P(OfTheLoader, AllocationFaults, ::testing::Values(GetLoaderScenario()),
+                         NameOfScenario);
+INSTANTIATE_TEST_SUITE_P(Of, RequestFaults, ::testing::ValuesIn(GetScenarios()), NameOfScenario);
 
 } // namespace
 } // namespace Moka::Testing

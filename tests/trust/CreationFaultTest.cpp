@@ -40,6 +40,7 @@ TEST_P(CreationFaults, LeaveNothingBehindAndTheNextFrameRight) {
 }
 
 INSTANTIATE_TEST_SUITE_P(Of, CreationFaults, ::testing::ValuesIn(GetScenarios()), NameOfScenario);
+INSTANTIATE_TEST_SUITE_P(OfTheLoader, CreationFaults, ::testing::Values(GetLoaderScenario()), NameOfScenario);
 
 } // namespace
 } // namespace Moka::Testing

@@ -10,6 +10,8 @@
 namespace Moka::Testing {
 namespace {
 
+thread_local int tPauses = 0;
+
 struct Sweep {
     std::atomic<bool> isArmed{false};
     std::atomic<int> count{0};
@@ -79,7 +81,8 @@ void* Allocate(std::size_t size, bool isCounted) noexcept {
 }
 
 void* AllocateOrThrow(std::size_t size) {
-    void* const memory = SweepOf(Faults::Kind::Throwing).Fails() ? nullptr : Allocate(size, false);
+    bool const fails = tPauses == 0 && SweepOf(Faults::Kind::Throwing).Fails();
+    void* const memory = fails ? nullptr : Allocate(size, false);
     if (!memory) throw std::bad_alloc();
     return memory;
 }
@@ -95,6 +98,7 @@ void Free(void* memory) noexcept {
 class TaskBlocks {
 public:
     void Add(void* block) {
+        Faults::Pause const pause;
         std::lock_guard<std::mutex> const lock(mMutex);
         if (block) mBlocks.insert(block);
     }
@@ -138,6 +142,9 @@ int Faults::Disarm() {
         if (sweep.isArmed.exchange(false)) count = sweep.count;
     return count;
 }
+
+Faults::Pause::Pause() { ++tPauses; }
+Faults::Pause::~Pause() { --tPauses; }
 
 std::int64_t Faults::CountLive(Kind kind) {
     return kind == Kind::Objects ? theObjects.list.GetCount()

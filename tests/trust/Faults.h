@@ -21,6 +21,15 @@ public:
     // How many of the kind there were since, failed ones included.
     static int Disarm();
 
+    // While it lives, those of its thread's allocations that throw neither fail nor count.
+    class Pause {
+    public:
+        Pause();
+        ~Pause();
+        Pause(Pause const&) = delete;
+        Pause& operator=(Pause const&) = delete;
+    };
+
     // Not yet freed.
     static std::int64_t CountLive(Kind kind);
     // Blocks given back that had not been given out, or twice.

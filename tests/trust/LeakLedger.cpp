@@ -47,7 +47,7 @@ T* ObjectOf(ITask* task) {
 template <class T, class First, class... Others>
 First FirstArgument(ITask* task) {
     using Arguments = std::tuple<First, Others...>;
-    constexpr std::size_t kBefore = sizeof(ITask) + sizeof(T*) + sizeof(void(T::*)());
+    constexpr std::size_t kBefore = sizeof(ITask) + sizeof(void*) + sizeof(void(T::*)());
     static_assert(sizeof(WorkerTask::Member<T, void (T::*)(), First, Others...>) ==
                   kBefore + sizeof(Arguments));
     Arguments const sample{};

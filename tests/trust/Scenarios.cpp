@@ -71,7 +71,7 @@ void CreateAndRead(Stage const& stage) {
 }
 
 void CreateOfOwnedPixels(Stage const& stage) {
-    std::unique_ptr<unsigned char[]> pixels(new (std::nothrow) unsigned char[kWidth * kHeight * 4]());
+    std::unique_ptr<unsigned char[]> pixels(new (std::nothrow) unsigned char[GetImage().pixels.size()]());
     if (!pixels) return;
     auto const bitmap = BitmapPtr::Adopt(
         MKGraphicsFactory::CreateBitmap(&stage.queue, kWidth, kHeight, pixels.get(), true, 1, false));

@@ -24,4 +24,8 @@ struct Scenario {
 
 std::vector<Scenario> const& GetScenarios();
 
+// Loads and saves with the loader. Not among the others, since it waits for every callback, and a save whose
+// read-back is refused calls nobody, as callers know.
+Scenario GetLoaderScenario();
+
 } // namespace Moka::Testing

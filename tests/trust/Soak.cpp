@@ -111,6 +111,7 @@ int GetMostObjects(std::vector<Sample> const& samples, std::size_t count) {
 }
 
 int Soak(std::int64_t operations) {
+    mallopt(M_ARENA_MAX, 1); // so that the heap's count has every thread's blocks
     SetLogSink([](LogLine const&) {});
     std::unique_ptr<IGLMsgQueue> const queue = StartRenderThread();
     if (!queue) return 1;

@@ -128,6 +128,17 @@ void MKTextureBitmap::GetBitmapDataAsync(Rect const& r, void* destination, void*
     ForEachStrip([&](IMKSubBitmap* strip) {
         strip->GetBitmapDataAsync(r, destination, userData, strip == last ? callback : nullptr);
     });
+    // Memory ran out for every strip; whoever waits for the callback must not wait for ever.
+    if (!last && callback && GetHeight() > 0) {
+        Ref();
+        WorkerTask::PostMember(mMsgQueue, this, &MKTextureBitmap::CallBackRT, r, destination, userData,
+                               callback);
+    }
+}
+
+void MKTextureBitmap::CallBackRT(Rect const& r, void* destination, void* userData, DataCallback callback) {
+    callback(r, destination, userData);
+    Unref();
 }
 
 void MKTextureBitmap::SetTag(char const* tag) {

@@ -98,6 +98,7 @@ private:
     void BuildStrips(Rect const& region, void const* pixels, bool renderThread, bool textureFlag);
     void ShareStrip(int index, IMKSubBitmap* model, bool renderThread);
     void FreePixels(void const* pixels, bool renderThread);
+    void CallBackRT(Rect const& r, void* destination, void* userData, DataCallback callback);
 
     // A strip that memory ran out for is a null entry; every walk skips it.
     template <class Action>

@@ -19,32 +19,23 @@ void ShaderManager::LogNew(char const* name) {
     __android_log_print(ANDROID_LOG_DEBUG, "mok_log", "ShaderManager::GetShader, New %s is added", name);
 }
 
-ShaderManager::Entry* ShaderManager::Find(Key const& key) {
-    auto const found = mEntries.find(key);
+ShaderManager::Entry* ShaderManager::Find(char const* name) {
+    auto const found = mEntries.find(name);
     return found == mEntries.end() ? nullptr : &found->second;
 }
 
-ShaderManager::Entry& ShaderManager::Add(Key const& key, void* shader) {
-    Entry& entry = mEntries[key];
+ShaderManager::Entry& ShaderManager::Add(char const* name, void* shader) {
+    Entry& entry = mEntries[Key(name)];
     entry.shader = shader;
     return entry;
 }
 
-ShaderManager::Entry* ShaderManager::FindToRelease(Key const& key, void const* shader) {
-    Entry* const entry = Find(key);
-    if (!entry) {
-        __android_log_print(ANDROID_LOG_ERROR, "mok_log",
-                            "%s. Shader (%s) not in shader manager (not found).", "ReleaseShader",
-                            key.GetName());
-        return nullptr;
-    }
-    if (entry->shader != shader) {
-        __android_log_print(ANDROID_LOG_ERROR, "mok_log",
-                            "%s. Shader (%s) not in shader manager (pointer mismatch).", "ReleaseShader",
-                            key.GetName());
-        return nullptr;
-    }
-    return entry;
+ShaderManager::Entries::iterator ShaderManager::FindToRelease(char const* name, void const* shader) {
+    auto const found = mEntries.find(name);
+    if (found != mEntries.end() && found->second.shader == shader) return found;
+    __android_log_print(ANDROID_LOG_ERROR, "mok_log", "%s. Shader (%s) not in shader manager (%s).",
+                        "ReleaseShader", name, found == mEntries.end() ? "not found" : "pointer mismatch");
+    return mEntries.end();
 }
 
 } // namespace Moka

@@ -11,6 +11,7 @@
 #include "moka/base/NonAssignable.h"
 
 #include <cstdint>
+#include <functional>
 #include <map>
 #include <memory>
 #include <new>
@@ -21,12 +22,14 @@ namespace Moka {
 
 class MOKA_API ShaderManager : NonAssignable {
 public:
-    // Names a shader class: the text of its run-time type.
+    // Names a shader class: the text of its run-time type. Compared with such a text as well, so that only a new
+    // entry takes memory: shaders are given back in destructors.
     class Key {
     public:
         explicit Key(char const* name) : mName(name) {}
-        char const* GetName() const { return mName.c_str(); }
         friend bool operator<(Key const& a, Key const& b) { return a.mName < b.mName; }
+        friend bool operator<(Key const& key, char const* name) { return key.mName < name; }
+        friend bool operator<(char const* name, Key const& key) { return name < key.mName; }
 
     private:
         std::string mName;
@@ -41,11 +44,11 @@ public:
     T* GetShader() {
         AutoCriticalSection const hold(mLock);
         char const* const name = typeid(T).name();
-        Entry* entry = Find(Key(name));
+        Entry* entry = Find(name);
         if (!entry) {
             LogNew(name);
             std::unique_ptr<T> shader(new (std::nothrow) T);
-            entry = &Add(Key(name), shader.get());
+            entry = &Add(name, shader.get());
             static_cast<void>(shader.release()); // the entry's now
         }
         ++entry->users;
@@ -57,14 +60,13 @@ public:
     void ReleaseShader(T* shader) {
         if (!shader) return;
         AutoCriticalSection const hold(mLock);
-        Key const key(typeid(T).name());
-        Entry* const entry = FindToRelease(key, shader);
-        if (!entry) return;
-        if (entry->users == 1) {
+        auto const held = FindToRelease(typeid(T).name(), shader);
+        if (held == mEntries.end()) return;
+        if (held->second.users == 1) {
             delete shader;
-            RemoveShader(key);
+            RemoveShader(held->first);
         } else {
-            --entry->users;
+            --held->second.users;
         }
     }
 
@@ -77,17 +79,19 @@ private:
         std::uint32_t users = 0;
     };
 
+    using Entries = std::map<Key, Entry, std::less<>>;
+
     ShaderManager() = default;
     ~ShaderManager() = default;
 
     static void LogNew(char const* name);
-    Entry* Find(Key const& key);
-    Entry& Add(Key const& key, void* shader);
-    // Null, with an error line, when the manager has none of the class or another one.
-    Entry* FindToRelease(Key const& key, void const* shader);
+    Entry* Find(char const* name);
+    Entry& Add(char const* name, void* shader);
+    // The end, with an error line, when the manager has none of the class or another one.
+    Entries::iterator FindToRelease(char const* name, void const* shader);
 
     CriticalSection mLock{true}; // recursive: the last release removes the entry while it holds it
-    std::map<Key, Entry> mEntries;
+    Entries mEntries;
 };
 
 } // namespace Moka

@@ -17,7 +17,6 @@ void LogInfo(char const* text) { __android_log_print(ANDROID_LOG_INFO, kTag, "%s
 // A handle is the object's address. But for Native_finalize, Java never passes 0.
 struct DisplayGlue {
     static Display* FromHandle(jlong handle) {
-        // NOLINTNEXTLINE(performance-no-int-to-ptr): Java has no pointers
         return reinterpret_cast<Display*>(static_cast<std::intptr_t>(handle));
     }
 

@@ -1,6 +1,5 @@
 #include "moka/graphics/task/TaskMemory.h"
 
-#include <cstdlib>
 #include <mutex>
 #include <new>
 #include <utility>
@@ -19,10 +18,10 @@
 namespace Moka::detail {
 namespace {
 
-void* AllocateAligned(std::size_t size) noexcept {
-    void* memory = nullptr;
-    return posix_memalign(&memory, kTaskAlignment, size) == 0 ? memory : nullptr;
-}
+constexpr std::align_val_t kAlignment{kTaskAlignment};
+
+void* AllocateAligned(std::size_t size) noexcept { return operator new(size, kAlignment, std::nothrow); }
+void FreeAligned(void* memory) noexcept { operator delete(memory, kAlignment); }
 
 } // namespace
 
@@ -66,7 +65,7 @@ struct Batch {
     }
 };
 
-// Memory as it came from malloc: this line, then kTaskBatch blocks.
+// Memory as it was allocated: this line, then kTaskBatch blocks.
 struct alignas(kTaskAlignment) Chunk {
     Chunk* next;
 };
@@ -210,7 +209,7 @@ void* AllocateTask(std::size_t size) noexcept {
 void FreeTask(void* memory, std::size_t size) noexcept {
     if (!memory) return;
     if (size > kLargest) {
-        std::free(memory);
+        FreeAligned(memory);
     } else {
         FreeBlockOf(memory, ClassOf(size));
     }
@@ -221,14 +220,14 @@ void FreeTask(void* memory) noexcept {
     for (std::size_t index = 0; index < kClassCount; ++index) {
         if (theDepots.each[index].Owns(memory, kClassSizes[index])) return FreeBlockOf(memory, index);
     }
-    std::free(memory);
+    FreeAligned(memory);
 }
 
 #else
 
 void* AllocateTask(std::size_t size) noexcept { return AllocateAligned(size); }
-void FreeTask(void* memory, std::size_t) noexcept { std::free(memory); }
-void FreeTask(void* memory) noexcept { std::free(memory); }
+void FreeTask(void* memory, std::size_t) noexcept { FreeAligned(memory); }
+void FreeTask(void* memory) noexcept { FreeAligned(memory); }
 
 #endif
 

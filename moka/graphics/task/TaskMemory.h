@@ -6,7 +6,7 @@
 // Cost:    one lock for each kTaskBatch blocks that a thread takes or gives. Memory is kept for reuse until
 //          the process ends: it is bounded by the most tasks ever queued and a few batches for each thread.
 // Fails:   null when memory runs out.
-// Under the address sanitizer every block comes from malloc, so that the use of a freed task is found.
+// Under the address sanitizer every block is allocated by itself, so that the use of a freed task is found.
 #pragma once
 
 #include <cstddef>

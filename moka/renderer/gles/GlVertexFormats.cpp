@@ -48,7 +48,6 @@ void GlVertexFormats::MakeVertexArray(Format& format) {
         int const components = descriptor.GetAttribute(i).components;
         auto const location = static_cast<GLuint>(i);
         glEnableVertexAttribArray(location);
-        // NOLINTNEXTLINE(performance-no-int-to-ptr): GL takes the offset as a pointer
         auto const* const pointer = reinterpret_cast<void const*>(offset);
         glVertexAttribPointer(location, components, GL_FLOAT, GL_FALSE, stride, pointer);
         offset += static_cast<std::uintptr_t>(components) * sizeof(GLfloat);
