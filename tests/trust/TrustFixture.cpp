@@ -131,6 +131,8 @@ void TrustFixture::TearDown() {
     ForgetShaders(); // those that a leaked drawable holds die with the renderer's next reset
     RecordingRenderer::DeclareRenderThread();
     RendererFactory::DetachContext();
+    for (auto const& file : std::filesystem::directory_iterator(folder))
+        EXPECT_NE(file.path().extension(), ".tmp") << "a save left its temporary file";
     std::filesystem::remove_all(folder);
     SetLogSink({});
 }

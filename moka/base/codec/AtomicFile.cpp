@@ -34,8 +34,7 @@ std::string RandomLetters() {
 
 // A rename is only safe from a power failure when the folder is on the disk too. Not every file system can do
 // it, and the file itself is whole either way, so a refusal is no failure.
-void FlushFolder(std::string const& path) {
-    std::string const folder = FolderOf(path);
+void FlushFolder(std::string const& folder) {
     int const file = open(folder.empty() ? "." : folder.c_str(), O_RDONLY | O_DIRECTORY | O_CLOEXEC);
     if (file < 0) return;
     fsync(file);
@@ -97,7 +96,7 @@ bool AtomicFile::CreateTemporary() {
         // apply.
         mFile = open(candidate.c_str(), O_WRONLY | O_CREAT | O_EXCL | O_CLOEXEC, 0666);
         if (mFile >= 0) {
-            mTemporary = candidate;
+            mTemporary = std::move(candidate); // throws nothing, so that the file is never forgotten
             return true;
         }
         if (errno != EEXIST && errno != EINTR) break;
@@ -132,9 +131,10 @@ bool AtomicFile::Commit() {
     int const error = errno;
     mFile = -1;
     if (closed != 0 && error != EINTR) return Fail("cannot finish it", error);
+    std::string const folder = FolderOf(mTarget); // nothing may fail once the file is renamed
     if (rename(mTemporary.c_str(), mTarget.c_str()) != 0) return Fail("cannot rename to it", errno);
     mTemporary.clear();
-    FlushFolder(mTarget);
+    FlushFolder(folder);
     return true;
 }
 

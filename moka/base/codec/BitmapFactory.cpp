@@ -45,6 +45,17 @@ void LogFailure(char const* action, std::string const& path, std::string const& 
                         Printable(path).c_str(), reason.c_str());
 }
 
+// Strings and codecs throw when memory runs out, which is a failure like any other here.
+template <class Function>
+auto Attempt(char const* action, Function const& function) -> decltype(function()) {
+    try {
+        return function();
+    } catch (std::bad_alloc const&) {
+        __android_log_print(ANDROID_LOG_ERROR, "mok_log", "cannot %s image: not enough memory", action);
+        return {};
+    }
+}
+
 bool ToPath(String const* text, std::string& path, std::string& reason) {
     if (text) path = text->ToUtf8();
     if (path.empty()) {
@@ -151,63 +162,72 @@ bool Save(Bitmap const* bitmap, std::string const& path, int quality, std::strin
 } // namespace
 
 Bitmap* BitmapFactory::CreateBitmap(String const* path, int width, int height) {
-    std::string reason;
-    if (detail::CheckSize(width, height, reason)) return DecodeFile(path, {width, height});
-    LogFailure("read", path ? path->ToUtf8() : std::string(), "the size asked for, " + reason);
-    return nullptr;
+    return Attempt("read", [&]() -> Bitmap* {
+        std::string reason;
+        if (detail::CheckSize(width, height, reason)) return DecodeFile(path, {width, height});
+        LogFailure("read", path ? path->ToUtf8() : std::string(), "the size asked for, " + reason);
+        return nullptr;
+    });
 }
 
-Bitmap* BitmapFactory::CreateBitmapForGraphics(String const* path) { return DecodeFile(path, {}); }
+Bitmap* BitmapFactory::CreateBitmapForGraphics(String const* path) {
+    return Attempt("read", [&] { return DecodeFile(path, {}); });
+}
 
 Bitmap* BitmapFactory::CreateBitmapFromMemory(void const* data, std::size_t size, char const* name) {
-    std::string reason;
-    ImageSource source;
-    source.OpenMemory(data, data ? size : 0);
-    Bitmap* const bitmap = Decode(source, {}, reason);
-    if (!bitmap) LogFailure("read", name ? name : "in memory", reason);
-    return bitmap;
+    return Attempt("read", [&] {
+        std::string reason;
+        ImageSource source;
+        source.OpenMemory(data, data ? size : 0);
+        Bitmap* const bitmap = Decode(source, {}, reason);
+        if (!bitmap) LogFailure("read", name ? name : "in memory", reason);
+        return bitmap;
+    });
 }
 
 Bitmap* BitmapFactory::CreateBitmapFromBuffer(unsigned char* buffer, int width, int height, int stride,
                                               int format, bool deleteBuffer) {
     Bitmap* const bitmap = Wrap(buffer, {width, height}, stride, format, deleteBuffer);
     if (!bitmap) {
-        LogFailure("wrap", "pixels",
-                   std::to_string(width) + " x " + std::to_string(height) + ", stride " +
-                       std::to_string(stride) + ", format " + std::to_string(format) +
-                       (buffer ? " is not a picture" : " without a buffer"));
+        __android_log_print(ANDROID_LOG_ERROR, "mok_log",
+                            "cannot wrap image 'pixels': %d x %d, stride %d, format %d%s", width, height,
+                            stride, format, buffer ? " is not a picture" : " without a buffer");
     }
     return bitmap;
 }
 
 bool BitmapFactory::SaveBitmap(Bitmap const* bitmap, String const* path, int quality) {
-    std::string text;
-    std::string reason;
-    bool const isSaved =
-        ToPath(path, text, reason) && Save(bitmap, text, std::clamp(quality, 0, 100), reason);
-    if (!isSaved) LogFailure("save", text, reason);
-    return isSaved;
+    return Attempt("save", [&] {
+        std::string text;
+        std::string reason;
+        bool const isSaved =
+            ToPath(path, text, reason) && Save(bitmap, text, std::clamp(quality, 0, 100), reason);
+        if (!isSaved) LogFailure("save", text, reason);
+        return isSaved;
+    });
 }
 
 bool BitmapFactory::GetImageInfo(String const* path, ImageInfo* info) {
-    std::string text;
-    std::string reason;
-    ImageSource source;
-    ImageInfo found;
-    bool const isOpen = ToPath(path, text, reason) && source.OpenFile(text.c_str(), reason);
-    ImageCodec const* const codec = isOpen ? FindCodec(source, reason) : nullptr;
-    if (!codec || !codec->readInfo(source, found, reason)) {
-        LogFailure("read", text, reason);
-        return false;
-    }
-    found.format = codec->format;
-    found.fileBytes = source.GetSize();
-    if (info) *info = found;
-    return true;
+    return Attempt("read", [&] {
+        std::string text;
+        std::string reason;
+        ImageSource source;
+        ImageInfo found;
+        bool const isOpen = ToPath(path, text, reason) && source.OpenFile(text.c_str(), reason);
+        ImageCodec const* const codec = isOpen ? FindCodec(source, reason) : nullptr;
+        if (!codec || !codec->readInfo(source, found, reason)) {
+            LogFailure("read", text, reason);
+            return false;
+        }
+        found.format = codec->format;
+        found.fileBytes = source.GetSize();
+        if (info) *info = found;
+        return true;
+    });
 }
 
 ImageFormat BitmapFactory::GetFormatByExtension(String const* path) {
-    return path ? FormatOf(path->ToUtf8()) : ImageFormat::Unknown;
+    return Attempt("name", [&] { return path ? FormatOf(path->ToUtf8()) : ImageFormat::Unknown; });
 }
 
 char const* BitmapFactory::GetFormatName(ImageFormat format) {

@@ -5,12 +5,23 @@
 #include "moka/base/log/AndroidLog.h"
 
 #include <atomic>
+#include <new>
 
 namespace Moka {
 namespace {
 
 std::atomic<bool> useNativeDecoder{false};
 std::atomic<detail::JavaDecoder> javaDecoder{nullptr};
+
+// False when memory runs out.
+template <class Function>
+bool WithoutThrowing(Function const& function) {
+    try {
+        return function();
+    } catch (std::bad_alloc const&) {
+        return false;
+    }
+}
 
 Bitmap* DecodeNatively(String const* path, int width, int height) {
     if (width != 0 && height != 0) return BitmapFactory::CreateBitmap(path, width, height);
@@ -21,14 +32,17 @@ Bitmap* DecodeNatively(String const* path, int width, int height) {
 
 bool GetExtensionByFile(String const* path, String* extension) {
     if (!path || !extension) return false;
-    String const source = *path; // extension may be path itself
-    extension->Clear();
-    return source.SubString(source.ReverseFind(".") + 1, extension);
+    return WithoutThrowing([&] {
+        String const source = *path; // extension may be path itself
+        extension->Clear();
+        return source.SubString(source.ReverseFind(".") + 1, extension);
+    });
 }
 
 bool CompareExtensionByFile(String const* path, char const* extension) {
     String own;
-    return extension && GetExtensionByFile(path, &own) && own.CompareTo(extension) == 0;
+    return extension && GetExtensionByFile(path, &own) &&
+           WithoutThrowing([&] { return own.CompareTo(extension) == 0; });
 }
 
 void MKBitmapFactory_UseNativeDecoder() { useNativeDecoder = true; }
