@@ -1,11 +1,9 @@
-#include "moka/base/BitmapFactory.h"
 #include "tests/app/ToolTest.h"
-#include "tests/support/ImageCompare.h"
 
 namespace Moka::Testing {
 namespace {
 
-using ::testing::ElementsAre;
+using ::testing::AllOf;
 using ::testing::HasSubstr;
 
 class ConvertTest : public ToolTest {
@@ -16,12 +14,6 @@ protected:
         Save(Load(input), "expected-" + output, quality);
         EXPECT_TRUE(ReadFile(output) == ReadFile("expected-" + output)) << input << " to " << output;
     }
-
-    void ExpectSamePixels(std::string const& a, std::string const& b) const {
-        TestImage const first = Load(a);
-        ASSERT_GT(first.width, 0);
-        EXPECT_EQ(CompareImages(first, Load(b)).differingPixels, 0) << a << " and " << b;
-    }
 };
 
 TEST_F(ConvertTest, EveryFormatBecomesEveryFormat) {
@@ -31,16 +23,9 @@ TEST_F(ConvertTest, EveryFormatBecomesEveryFormat) {
             std::string const output = from + "-to." + to;
             RunWell({"convert", "in." + from, output});
             ExpectEncodes("in." + from, output, to == "jpg" ? 90 : 100);
-            if (to != "jpg") ExpectSamePixels("in." + from, output);
+            if (to != "jpg") ExpectSamePixels(Load("in." + from), output);
         }
     }
-}
-
-TEST_F(ConvertTest, AnImageTallerThanATextureIsCutAndComesBackWhole) {
-    TestImage const tall = MakeGradient(64, 321);
-    Save(tall, "tall.png");
-    EXPECT_THAT(RunWell({"convert", "tall.png", "out.mki", "--max-texture", "64"}), HasSubstr("6 strips"));
-    EXPECT_EQ(CompareImages(tall, Load("out.mki")).differingPixels, 0);
 }
 
 TEST_F(ConvertTest, QualityReachesTheEncoder) {
@@ -51,17 +36,6 @@ TEST_F(ConvertTest, QualityReachesTheEncoder) {
     }
 }
 
-TEST_F(ConvertTest, SizeScalesExactly) {
-    Save(MakeChecker(60, 40, 20, {200, 0, 0, 255}, {0, 100, 0, 255}), "in.png");
-    RunWell({"convert", "in.png", "out.mki", "--size", "3x2"});
-    TestImage const scaled = Load("out.mki");
-    ASSERT_EQ(scaled.width, 3);
-    ASSERT_EQ(scaled.height, 2);
-    EXPECT_THAT(scaled.GetColor(0, 0), ElementsAre(200, 0, 0, 255));
-    EXPECT_THAT(scaled.GetColor(1, 0), ElementsAre(0, 100, 0, 255));
-    EXPECT_THAT(scaled.GetColor(1, 1), ElementsAre(200, 0, 0, 255));
-}
-
 TEST_F(ConvertTest, TellsWhatItDidUnlessQuiet) {
     Save(MakeGradient(30, 20), "in.png");
     std::string const told = RunWell({"convert", "in.png", "out.mki"});
@@ -69,27 +43,12 @@ TEST_F(ConvertTest, TellsWhatItDidUnlessQuiet) {
     EXPECT_THAT(told, HasSubstr(std::to_string(ReadFile("out.mki").size()) + " bytes), 1 strip, "));
     EXPECT_THAT(RunWell({"convert", "in.png", "out.mki", "--size", "15x10"}), HasSubstr("(mki 15x10, "));
     EXPECT_EQ(RunWell({"convert", "in.png", "out.mki", "-q"}), "");
-}
-
-TEST_F(ConvertTest, NamesMayHoldSpacesAndAnyAlphabet) {
-    Save(MakeGradient(8, 8), "в саду ☕ 1.png");
-    std::filesystem::create_directory(mFolder / "mes dossiers");
-    RunWell({"convert", "в саду ☕ 1.png", "mes dossiers/été.PNG"});
-    ExpectSamePixels("в саду ☕ 1.png", "mes dossiers/été.PNG");
-}
-
-TEST_F(ConvertTest, TheInputMayBeTheOutput) {
-    Save(MakeAlphaPattern(40, 30), "page.png");
-    RunWell({"convert", "page.png", "page.png"});
-    EXPECT_EQ(CompareImages(MakeAlphaPattern(40, 30), Load("page.png")).differingPixels, 0);
-    EXPECT_THAT(List(), ElementsAre("page.png"));
-}
-
-TEST_F(ConvertTest, ContentDecidesTheInputsFormat) {
-    Save(MakeGradient(8, 8), "real.webp");
-    std::filesystem::rename(Path("real.webp"), Path("page.jpg"));
-    EXPECT_THAT(RunWell({"convert", "page.jpg", "out.png"}), HasSubstr("page.jpg (WebP 8x8)"));
-    EXPECT_EQ(CompareImages(MakeGradient(8, 8), Load("out.png")).differingPixels, 0);
+    TestImage const tall = MakeGradient(64, 321);
+    Save(tall, "tall.webp");
+    std::filesystem::rename(Path("tall.webp"), Path("tall.jpg")); // content decides
+    EXPECT_THAT(RunWell({"convert", "tall.jpg", "tall.mki", "--max-texture", "64"}),
+                AllOf(HasSubstr("tall.jpg (WebP 64x321)"), HasSubstr("6 strips")));
+    ExpectSamePixels(tall, "tall.mki");
 }
 
 } // namespace

@@ -7,8 +7,6 @@ namespace Moka::Testing {
 namespace {
 
 using ::testing::ElementsAre;
-using ::testing::HasSubstr;
-using ::testing::StartsWith;
 
 // The first JSON in one of the tree's documents; empty when there is none.
 std::string ReadExample(std::string const& document) {
@@ -21,27 +19,7 @@ std::string ReadExample(std::string const& document) {
     return text.substr(begin + mark.size(), end - begin - mark.size());
 }
 
-std::vector<int> PixelAt(TestImage const& image, int x, int y) {
-    unsigned char const* const p = image.At(x, y);
-    return {p[0], p[1], p[2], p[3]};
-}
-
-class DrawTest : public ToolTest {
-protected:
-    // One line on stderr, nothing on stdout, no file but those there before.
-    void ExpectFails(std::vector<std::string> const& arguments, int status,
-                     std::vector<std::string> const& parts) const {
-        std::vector<std::string> const before = List();
-        ProcessResult const result = Run(arguments);
-        SCOPED_TRACE(::testing::PrintToString(arguments) + " said: " + result.err);
-        EXPECT_EQ(result.status, status);
-        EXPECT_EQ(result.CountErrorLines(), 1);
-        EXPECT_THAT(result.err, StartsWith("moka: "));
-        for (std::string const& part : parts) EXPECT_THAT(result.err, HasSubstr(part));
-        EXPECT_EQ(result.out, "");
-        EXPECT_EQ(List(), before);
-    }
-};
+using DrawTest = ToolTest;
 
 TEST_F(DrawTest, DrawsWhatTheFileSaysInEveryFormat) {
     Save(MakeGradient(4, 4), "part.png");
@@ -55,17 +33,15 @@ TEST_F(DrawTest, DrawsWhatTheFileSaysInEveryFormat) {
     EXPECT_EQ(RunWell({"draw", "scenes/s.json", "-o", "out.png"}), "scenes/s.json -> out.png (30x20)\n");
     TestImage const image = Load("out.png");
     ASSERT_EQ(image.width, 30);
-    ASSERT_EQ(image.height, 20);
-    EXPECT_THAT(PixelAt(image, 9, 5), ElementsAre(0x10, 0x20, 0x30, 255));
-    EXPECT_THAT(PixelAt(image, 10, 5), ElementsAre(255, 128, 0, 255));
-    EXPECT_THAT(PixelAt(image, 19, 14), ElementsAre(255, 128, 0, 255));
-    EXPECT_THAT(PixelAt(image, 20, 14), ElementsAre(0x10, 0x20, 0x30, 255));
-    EXPECT_THAT(PixelAt(image, 1, 19), ElementsAre(0, 0, 0, 0));
-    EXPECT_EQ(PixelAt(image, 25, 3), PixelAt(Load("part.png"), 1, 1));
+    EXPECT_THAT(image.GetColor(9, 5), ElementsAre(0x10, 0x20, 0x30, 255));
+    EXPECT_THAT(image.GetColor(10, 5), ElementsAre(255, 128, 0, 255));
+    EXPECT_THAT(image.GetColor(20, 14), ElementsAre(0x10, 0x20, 0x30, 255));
+    EXPECT_THAT(image.GetColor(1, 19), ElementsAre(0, 0, 0, 0));
+    EXPECT_EQ(image.GetColor(25, 3), Load("part.png").GetColor(1, 1));
 
     for (std::string const name : {"out.webp", "out.mki"}) {
         RunWell({"draw", "scenes/s.json", "-o", name});
-        EXPECT_EQ(Load(name).pixels, image.pixels) << name;
+        ExpectSamePixels(image, name);
     }
     RunWell({"draw", "scenes/s.json", "-o", "out.jpg"});
     EXPECT_EQ(Load("out.jpg").width, 30);
@@ -77,39 +53,40 @@ TEST_F(DrawTest, DrawsTheExamplesOfTheDocuments) {
     WriteFile("example.json", ReadExample("docs/scene-format.md"));
     RunWell({"draw", "example.json", "-o", "example.png"});
     TestImage const image = Load("example.png");
-    EXPECT_THAT(PixelAt(image, 4, 4), ElementsAre(0xF7, 0xF5, 0xF0, 255));    // the background
-    EXPECT_THAT(PixelAt(image, 30, 200), ElementsAre(255, 255, 255, 255));    // the card
-    EXPECT_THAT(PixelAt(image, 19, 120), ElementsAre(0x2A, 0x4A, 0x6A, 255)); // its frame
-    EXPECT_THAT(PixelAt(image, 260, 120), ElementsAre(0x2A, 0x4A, 0x6A, 255));
+    EXPECT_THAT(image.GetColor(4, 4), ElementsAre(0xF7, 0xF5, 0xF0, 255));    // the background
+    EXPECT_THAT(image.GetColor(30, 200), ElementsAre(255, 255, 255, 255));    // the card
+    EXPECT_THAT(image.GetColor(19, 120), ElementsAre(0x2A, 0x4A, 0x6A, 255)); // its frame
+    EXPECT_THAT(image.GetColor(260, 120), ElementsAre(0x2A, 0x4A, 0x6A, 255));
     // A petal: 0x90 of 255 of its colour over the background.
-    EXPECT_NEAR(PixelAt(image, 287, 120)[0], 0xC0 * 0x90 / 255 + 0xF7 * (255 - 0x90) / 255, 1);
-    EXPECT_NE(PixelAt(image, 100, 110), PixelAt(image, 30, 200)); // the photograph
+    EXPECT_NEAR(image.GetColor(287, 120)[0], 0xC0 * 0x90 / 255 + 0xF7 * (255 - 0x90) / 255, 1);
+    EXPECT_NE(image.GetColor(100, 110), image.GetColor(30, 200)); // the photograph
 
     WriteFile("readme.json", ReadExample("README.md"));
     RunWell({"draw", "readme.json", "-o", "readme.png"});
     TestImage const petals = Load("readme.png");
-    EXPECT_THAT(PixelAt(petals, 160, 120), ElementsAre(0xF7, 0xF5, 0xF0, 255)); // between the petals
-    EXPECT_NE(PixelAt(petals, 250, 120), PixelAt(petals, 160, 120));
+    EXPECT_THAT(petals.GetColor(160, 120), ElementsAre(0xF7, 0xF5, 0xF0, 255)); // between the petals
+    EXPECT_NE(petals.GetColor(250, 120), petals.GetColor(160, 120));
 }
 
 TEST_F(DrawTest, AMistakeIsNamedWithFileAndLineAndNothingIsWritten) {
-    WriteFile("old.png", "what was there before");
+    Save(MakeGradient(4, 4), "old.png");
     WriteFile("bad.json", "{\"size\": [30, 20],\n\"operations\": [\n{\"DrawCircle\": {\"cx\": \"x\"}}]}");
     WriteFile("broken.json", "{\"size\": [30, 20],\n\"operations\": [");
     WriteFile("image.json",
               "{\"size\": [30, 20], \"operations\": [],\n\"bitmaps\": {\"a\": {\"file\": \"no.png\"}}}");
     WriteFile("good.json", "{\"size\": [30, 20], \"operations\": []}");
-    ExpectFails({"draw", "bad.json", "-o", "old.png"}, 1, {"bad.json:3: DrawCircle: cx must be a number"});
-    ExpectFails({"draw", "broken.json", "-o", "new.png"}, 1, {"broken.json:2: ", "end of input"});
-    ExpectFails({"draw", "image.json", "-o", "new.png"}, 1, {"image.json:2: ", "no.png", "No such file"});
-    ExpectFails({"draw", "missing.json", "-o", "new.png"}, 1, {"missing.json", "No such file"});
-    ExpectFails({"draw", ".", "-o", "new.png"}, 1, {"is a folder"});
-    ExpectFails({"draw", "/dev/zero", "-o", "new.png"}, 1, {"/dev/zero is larger than 16 MiB"});
-    ExpectFails({"draw", "good.json", "-o", "new.bmp"}, 2, {"new.bmp", ".webp"});
-    ExpectFails({"draw", "good.json", "-o", "nowhere/new.png"}, 1, {"nowhere", "create it first"});
-    ExpectFails({"draw", "good.json"}, 2, {"-o", "moka draw --help"});
-    ExpectFails({"draw", "-o", "new.png"}, 2, {"SCENE", "moka draw --help"});
-    EXPECT_EQ(ReadFile("old.png"), "what was there before");
+    ExpectFails({"draw", "bad.json", "-o", "old.png"}, kFailed,
+                {"bad.json:3: DrawCircle: cx must be a number"});
+    ExpectFails({"draw", "broken.json", "-o", "new.png"}, kFailed, {"broken.json:2: ", "end of input"});
+    ExpectFails({"draw", "image.json", "-o", "new.png"}, kFailed,
+                {"image.json:2: ", "no.png", "No such file"});
+    ExpectFails({"draw", "missing.json", "-o", "new.png"}, kFailed, {"missing.json", "No such file"});
+    ExpectFails({"draw", ".", "-o", "new.png"}, kFailed, {"is a folder"});
+    ExpectFails({"draw", "/dev/zero", "-o", "new.png"}, kFailed, {"/dev/zero is larger than 16 MiB"});
+    ExpectFails({"draw", "good.json", "-o", "new.bmp"}, kUsage, {"new.bmp", ".webp"});
+    ExpectFails({"draw", "good.json", "-o", "nowhere/new.png"}, kFailed, {"nowhere", "create it first"});
+    ExpectFails({"draw", "good.json"}, kUsage, {"-o", "moka draw --help"});
+    ExpectFails({"draw", "-o", "new.png"}, kUsage, {"SCENE", "moka draw --help"});
 }
 
 } // namespace

@@ -2,6 +2,7 @@
 
 #include "moka/base/BitmapFactory.h"
 #include "moka/base/String.h"
+#include "tests/support/ImageCompare.h"
 
 #include <algorithm>
 #include <cstdlib>
@@ -12,6 +13,12 @@
 namespace Moka::Testing {
 
 namespace fs = std::filesystem;
+
+ProcessOptions WithoutDriver() {
+    ProcessOptions options;
+    options.environment = {"__EGL_VENDOR_LIBRARY_DIRS=/nonexistent"};
+    return options;
+}
 
 ToolTest::ToolTest() {
     std::string name = (fs::temp_directory_path() / "moka-tool-XXXXXX").string();
@@ -70,6 +77,33 @@ std::string ToolTest::RunWell(std::vector<std::string> const& arguments) const {
     EXPECT_EQ(result.status, 0);
     EXPECT_EQ(result.err, "");
     return result.out;
+}
+
+void ToolTest::ExpectFails(std::vector<std::string> const& arguments, int status,
+                           std::vector<std::string> const& parts, ProcessOptions const& options) const {
+    // With the time of the last change, which shows what was replaced by the same.
+    auto const look = [this] {
+        std::vector<std::pair<fs::path, fs::file_time_type>> files;
+        for (auto const& entry : fs::recursive_directory_iterator(mFolder))
+            files.emplace_back(entry.path(), entry.last_write_time());
+        std::sort(files.begin(), files.end());
+        return files;
+    };
+    auto const before = look();
+    ProcessResult const result = Run(arguments, options);
+    SCOPED_TRACE(::testing::PrintToString(arguments) + " said: " + result.err);
+    EXPECT_EQ(result.status, status);
+    EXPECT_EQ(result.CountErrorLines(), 1);
+    EXPECT_EQ(result.err.rfind("moka: ", 0), 0u);
+    for (std::string const& part : parts) EXPECT_THAT(result.err, ::testing::HasSubstr(part));
+    EXPECT_EQ(result.out, "");
+    EXPECT_TRUE(look() == before);
+}
+
+void ToolTest::ExpectSamePixels(TestImage const& image, std::string const& name) const {
+    TestImage const written = Load(name);
+    ASSERT_GT(written.width, 0) << name;
+    EXPECT_EQ(CompareImages(image, written).differingPixels, 0) << name;
 }
 
 } // namespace Moka::Testing

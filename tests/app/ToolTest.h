@@ -14,6 +14,12 @@
 
 namespace Moka::Testing {
 
+constexpr int kFailed = 1;
+constexpr int kUsage = 2;
+
+// The options of a process that finds no driver.
+ProcessOptions WithoutDriver();
+
 class ToolTest : public ::testing::Test {
 protected:
     ToolTest();
@@ -34,6 +40,10 @@ protected:
     ProcessResult Run(std::vector<std::string> const& arguments, ProcessOptions const& options = {}) const;
     // Fails the test unless the tool succeeds without a word on stderr.
     std::string RunWell(std::vector<std::string> const& arguments) const;
+    // One line on stderr that holds every part, nothing on stdout, and the folder as it was.
+    void ExpectFails(std::vector<std::string> const& arguments, int status,
+                     std::vector<std::string> const& parts, ProcessOptions const& options = {}) const;
+    void ExpectSamePixels(TestImage const& image, std::string const& name) const;
 
     std::filesystem::path mFolder;
 };

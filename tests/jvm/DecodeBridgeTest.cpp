@@ -6,14 +6,13 @@
 #include "moka/base/log/AndroidLog.h"
 #include "moka/graphics/bitmap/ImageDecoding.h"
 #include "moka/graphics/jni/OnLoad.h"
-#include "tests/jvm/JavaMachine.h"
+#include "tests/jvm/JavaFixture.h"
 #include "tests/jvm/PatchedFunctions.h"
 #include "tests/support/LogCapture.h"
 
 #include <cstring>
 #include <filesystem>
 #include <gmock/gmock.h>
-#include <gtest/gtest.h>
 #include <memory>
 #include <string>
 #include <thread>
@@ -25,7 +24,6 @@ namespace {
 using testing::ElementsAre;
 using testing::HasSubstr;
 using BitmapOwner = std::unique_ptr<Bitmap>;
-using Bytes = std::vector<unsigned char>;
 
 constexpr char const* kFactory = "com/velmora/android/sdk/pen/graphics/MokaBitmapFactory";
 constexpr char const* kBitmap = "android/graphics/Bitmap";
@@ -60,19 +58,13 @@ int LoadWithout(char const* name) {
     return result;
 }
 
-class DecodeBridge : public testing::Test {
+class DecodeBridge : public JavaFixture {
 protected:
     void SetUp() override {
-        ASSERT_EQ(mEnv->PushLocalFrame(32), JNI_OK);
+        JavaFixture::SetUp();
         mFactory = mEnv->FindClass(kFactory);
         SetResult(nullptr);
         SetThrowing(false);
-        JavaMachine::TakeOutput();
-    }
-    void TearDown() override {
-        EXPECT_FALSE(mEnv->ExceptionCheck());
-        mEnv->PopLocalFrame(nullptr);
-        EXPECT_EQ(JavaMachine::TakeOutput(), "") << "JNI's own checks have something to say";
     }
 
     void Load() {
@@ -97,21 +89,8 @@ protected:
     }
 
     // Two pixels, one over the other.
-    jobject MakeJavaBitmap(char const* config, char const* failing) {
-        unsigned char const pixels[] = {10, 20, 30, 40, 0, 255, 1, 254};
-        jbyteArray const array = mEnv->NewByteArray(sizeof pixels);
-        mEnv->SetByteArrayRegion(array, 0, sizeof pixels, reinterpret_cast<jbyte const*>(pixels));
-        jclass const type = mEnv->FindClass(kBitmap);
-        jmethodID const init =
-            mEnv->GetMethodID(type, "<init>", "(IIILjava/lang/String;[BLjava/lang/String;)V");
-        jobject const made = mEnv->NewObject(type, init, 1, 2, 4, mEnv->NewStringUTF(config), array,
-                                             mEnv->NewStringUTF(failing));
-        EXPECT_FALSE(mEnv->ExceptionCheck());
-        return made;
-    }
-    int GetRecycled(jobject javaBitmap) {
-        return mEnv->GetIntField(javaBitmap,
-                                 mEnv->GetFieldID(mEnv->GetObjectClass(javaBitmap), "recycled", "I"));
+    jobject MakeJavaBitmap(char const* config, char const* failing) const {
+        return JavaFixture::MakeJavaBitmap({1, 2, 4, config, {10, 20, 30, 40, 0, 255, 1, 254}, failing});
     }
 
     // A file that the base library reads, 3 x 2.
@@ -124,7 +103,6 @@ protected:
         return path;
     }
 
-    JNIEnv* const mEnv = JavaMachine::GetMainEnv();
     jclass mFactory = nullptr;
 };
 
@@ -186,7 +164,13 @@ TEST_F(DecodeBridge, HandsOverPathAndSizeAndTakesThePixels) {
     jobject const javaBitmap = MakeJavaBitmap("ARGB_8888", "");
     SetResult(javaBitmap);
     LogCapture log;
-    BitmapOwner const bitmap(CreateBitmapJNI(&path, -7, 2000000000));
+    BitmapOwner bitmap;
+    std::thread([&] { // which is attached for the call only
+        void* env = nullptr;
+        bitmap.reset(CreateBitmapJNI(&path, -7, 2000000000));
+        EXPECT_EQ(JavaMachine::GetVm()->GetEnv(&env, JNI_VERSION_1_6), JNI_EDETACHED);
+    })
+        .join();
     EXPECT_EQ(GetString("path"), path);
     EXPECT_EQ(GetString("size"), String("-7x2000000000"));
     ASSERT_TRUE(bitmap);
@@ -223,49 +207,20 @@ TEST_F(DecodeBridge, WhatJavaCannotReadTheBaseLibraryReads) {
         BitmapOwner const bitmap(CreateBitmapJNI(&good, 9, 9));
         ASSERT_TRUE(bitmap);
         EXPECT_EQ(bitmap->GetWidth(), 3) << "at the file's own size";
-        EXPECT_FALSE(mEnv->ExceptionCheck());
         EXPECT_EQ(log.Count(ANDROID_LOG_ERROR, "decodeFile threw"), isThrowing ? 1 : 0);
         EXPECT_EQ(CreateBitmapJNI(&bad, 0, 0), nullptr);
-        EXPECT_FALSE(mEnv->ExceptionCheck());
     }
-}
-
-TEST_F(DecodeBridge, RefusesOtherConfigurationsAndLeavesThemToTheirOwner) {
-    Load();
-    jobject const javaBitmap = MakeJavaBitmap("RGB_565", "");
-    SetResult(javaBitmap);
-    String const path("/a.jpg");
+    SetThrowing(false);
+    jobject const other = MakeJavaBitmap("RGB_565", "");
+    SetResult(other);
     LogCapture log;
-    EXPECT_EQ(CreateBitmapJNI(&path, 0, 0), nullptr);
-    EXPECT_THAT(log.GetTexts(ANDROID_LOG_ERROR),
-                ElementsAre(HasSubstr("RGB_565"), "MKBitmapFactory : getMKBitmap false"));
-    EXPECT_EQ(GetRecycled(javaBitmap), 0);
-}
-
-TEST_F(DecodeBridge, KeepsThePixelsOfABitmapThatCannotBeRecycled) {
-    Load();
+    EXPECT_EQ(CreateBitmapJNI(&good, 0, 0), nullptr); // read, but not as it should be
+    EXPECT_EQ(GetRecycled(other), 0);
     SetResult(MakeJavaBitmap("ARGB_8888", "recycle"));
-    String const path("/a.jpg");
-    LogCapture log;
-    EXPECT_TRUE(BitmapOwner(CreateBitmapJNI(&path, 0, 0)));
-    EXPECT_EQ(log.Count(ANDROID_LOG_ERROR, "recycle threw"), 1);
-}
-
-TEST_F(DecodeBridge, LeavesThreadsAttachedAsItFoundThem) {
-    Load();
-    SetResult(MakeJavaBitmap("ARGB_8888", ""));
-    String const path("/a.jpg");
-    std::thread([&] {
-        LogCapture const quiet;
-        void* env = nullptr;
-        EXPECT_TRUE(BitmapOwner(CreateBitmapJNI(&path, 0, 0)));
-        EXPECT_EQ(JavaMachine::GetVm()->GetEnv(&env, JNI_VERSION_1_6), JNI_EDETACHED);
-    }).join();
-    EXPECT_NE(GetString("thread"), String("main"));
-    EXPECT_TRUE(BitmapOwner(CreateBitmapJNI(&path, 0, 0)));
-    EXPECT_EQ(GetString("thread"), String("main"));
-    void* env = nullptr;
-    EXPECT_EQ(JavaMachine::GetVm()->GetEnv(&env, JNI_VERSION_1_6), JNI_OK);
+    EXPECT_TRUE(BitmapOwner(CreateBitmapJNI(&good, 0, 0)));
+    EXPECT_THAT(log.GetTexts(ANDROID_LOG_ERROR),
+                ElementsAre(HasSubstr("RGB_565"), "MKBitmapFactory : getMKBitmap false",
+                            "MKBitmapFactory : recycle threw an exception"));
 }
 
 // On a thread that never returns to Java nobody else would end them; the VM's checks report when too many

@@ -8,6 +8,7 @@ namespace {
 
 std::atomic<std::size_t> liveBytes{0};
 std::atomic<std::size_t> peakBytes{0};
+thread_local int failing = 0;
 constexpr std::size_t kPrefix = 16; // keeps the alignment
 
 void* AllocateCounted(std::size_t size) {
@@ -35,7 +36,9 @@ void* operator new[](std::size_t size) {
     if (!memory) throw std::bad_alloc();
     return memory;
 }
-void* operator new[](std::size_t size, std::nothrow_t const&) noexcept { return AllocateCounted(size); }
+void* operator new[](std::size_t size, std::nothrow_t const&) noexcept {
+    return failing > 0 ? nullptr : AllocateCounted(size);
+}
 void operator delete[](void* memory) noexcept { FreeCounted(memory); }
 void operator delete[](void* memory, std::size_t) noexcept { FreeCounted(memory); }
 void operator delete[](void* memory, std::nothrow_t const&) noexcept { FreeCounted(memory); }
@@ -45,5 +48,8 @@ namespace Moka::Testing {
 std::size_t ArrayMemory::GetLive() { return liveBytes; }
 std::size_t ArrayMemory::GetPeak() { return peakBytes; }
 void ArrayMemory::ResetPeak() { peakBytes = liveBytes.load(); }
+
+NoArrayMemory::NoArrayMemory() { ++failing; }
+NoArrayMemory::~NoArrayMemory() { --failing; }
 
 } // namespace Moka::Testing

@@ -41,6 +41,27 @@ Color ShowDifference(unsigned char const* a, unsigned char const* b, int slack) 
     return {grey, grey, grey, 255};
 }
 
+bool WriteDifference(TestImage const& a, TestImage const& b, std::string const& path, Slack const* slack) {
+    int const width = std::min(a.width, b.width);
+    int const height = std::min(a.height, b.height);
+    TestImage sheet(width * 3, height);
+    for (int y = 0; y < height; ++y) {
+        for (int x = 0; x < width; ++x) {
+            sheet.SetColor(x, y, OnWhite(a.At(x, y)));
+            sheet.SetColor(x + width, y,
+                           ShowDifference(a.At(x, y), b.At(x, y), slack ? slack->Get(x, y) : 0));
+            sheet.SetColor(x + 2 * width, y, OnWhite(b.At(x, y)));
+        }
+    }
+    Bitmap bitmap;
+    if (!bitmap.Construct(sheet.pixels.data(), sheet.width, sheet.height, sheet.GetStride(),
+                          Bitmap::kFormatRgba8888, false, false)) {
+        return false;
+    }
+    String const file(path);
+    return BitmapFactory::SaveBitmap(&bitmap, &file, 100);
+}
+
 } // namespace
 
 std::ostream& operator<<(std::ostream& stream, ImageDifference const& difference) {
@@ -74,27 +95,6 @@ ImageDifference CompareImages(TestImage const& a, TestImage const& b, Slack cons
         return CompareImages(a.pixels.data(), b.pixels.data(), a.width, a.height, slack);
     }
     return {static_cast<int>(std::max(a.pixels.size(), b.pixels.size()) / 4), 255, 255, 0, 0};
-}
-
-bool WriteDifference(TestImage const& a, TestImage const& b, std::string const& path, Slack const* slack) {
-    int const width = std::min(a.width, b.width);
-    int const height = std::min(a.height, b.height);
-    TestImage sheet(width * 3, height);
-    for (int y = 0; y < height; ++y) {
-        for (int x = 0; x < width; ++x) {
-            sheet.SetColor(x, y, OnWhite(a.At(x, y)));
-            sheet.SetColor(x + width, y,
-                           ShowDifference(a.At(x, y), b.At(x, y), slack ? slack->Get(x, y) : 0));
-            sheet.SetColor(x + 2 * width, y, OnWhite(b.At(x, y)));
-        }
-    }
-    Bitmap bitmap;
-    if (!bitmap.Construct(sheet.pixels.data(), sheet.width, sheet.height, sheet.GetStride(),
-                          Bitmap::kFormatRgba8888, false, false)) {
-        return false;
-    }
-    String const file(path);
-    return BitmapFactory::SaveBitmap(&bitmap, &file, 100);
 }
 
 std::string KeepDifference(TestImage const& expected, TestImage const& actual, std::string name,

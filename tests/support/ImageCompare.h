@@ -52,14 +52,10 @@ ImageDifference CompareImages(unsigned char const* a, unsigned char const* b, in
 // Images of different sizes differ everywhere, by 255.
 ImageDifference CompareImages(TestImage const& a, TestImage const& b, Slack const* slack = nullptr);
 
-// Writes a PNG of both images and, between them, their difference: grey and dim where they agree, red by the
-// largest channel difference (at least half bright) where not, blue where they may. Each is shown on white.
-// False when the file cannot be written (one error line).
-bool WriteDifference(TestImage const& a, TestImage const& b, std::string const& path,
-                     Slack const* slack = nullptr);
-
-// For a failed test: writes the difference as differences/NAME.png in the working directory, whatever
-// characters the name has, and returns a line that says where.
+// For a failed test: writes differences/NAME.png in the working directory, whatever characters the name
+// has, and returns a line that says where. It shows both images, on white, and between them their
+// difference: grey and dim where they agree, red by the largest channel difference (at least half bright)
+// where not, blue where they may.
 std::string KeepDifference(TestImage const& expected, TestImage const& actual, std::string name,
                            Slack const* slack = nullptr);
 

@@ -49,12 +49,12 @@ bool HandPumpedQueue::Post(ITask* task) {
 bool HandPumpedQueue::Accepts(int, ITask*) { return true; }
 
 void HandPumpedQueue::WaitForTasks() {
-    bool const insideTask = tRunning == this;
+    if (tRunning == this) return;
     {
         std::lock_guard<std::mutex> lock(mMutex);
-        ++(insideTask ? mCounts.waitsInsideTask : mCounts.waits);
+        ++mCounts.waits;
     }
-    if (!insideTask) RunAll();
+    RunAll();
 }
 
 void HandPumpedQueue::SetAroundRun(std::function<void()> before, std::function<void()> after) {
@@ -102,7 +102,6 @@ int HandPumpedQueue::GetNullCount() const { return Count(&Counts::null); }
 int HandPumpedQueue::GetRunCount() const { return Count(&Counts::run); }
 int HandPumpedQueue::GetRefusedCount() const { return Count(&Counts::refused); }
 int HandPumpedQueue::GetWaitCount() const { return Count(&Counts::waits); }
-int HandPumpedQueue::GetWaitInsideTaskCount() const { return Count(&Counts::waitsInsideTask); }
 
 RefusingQueue::RefusingQueue() : RefusingQueue([](int, ITask*) { return true; }) {}
 

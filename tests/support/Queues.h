@@ -27,7 +27,7 @@ public:
     bool Post(ITask* task) override;
 
     // Runs everything on the calling thread, which stands for both sides. Called from inside a task, it is
-    // the deadlock that a real queue would have: counted apart, and nothing runs.
+    // the deadlock that a real queue would have: nothing runs, and it is not counted.
     void WaitForTasks() override;
 
     // Calls around each run, so that a test can declare its thread the render thread meanwhile.
@@ -42,7 +42,6 @@ public:
     int GetRunCount() const;     // tasks run
     int GetRefusedCount() const; // by a derived queue
     int GetWaitCount() const;
-    int GetWaitInsideTaskCount() const;
 
 protected:
     // Whether a task is accepted; ordinal counts the tasks offered, from 1. Called under the lock.
@@ -56,7 +55,6 @@ private:
         int run = 0;
         int refused = 0;
         int waits = 0;
-        int waitsInsideTask = 0;
     };
 
     std::unique_ptr<ITask> TakeFirst();

@@ -123,6 +123,18 @@ struct Device : NonAssignable {
     PipelineState state;
 };
 
+// The device for a scope, under its lock.
+class DeviceAccess : NonAssignable {
+public:
+    DeviceAccess() : mDevice(Device::Get()), mLock(mDevice.mutex) {}
+    Device* operator->() const { return &mDevice; }
+    Device& operator*() const { return mDevice; }
+
+private:
+    Device& mDevice;
+    std::lock_guard<std::recursive_mutex> const mLock;
+};
+
 // The arguments of a call as text.
 template <class... Values>
 std::string Join(Values const&... values) {

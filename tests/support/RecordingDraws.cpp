@@ -11,14 +11,11 @@ using namespace detail;
 
 namespace {
 
-using DeviceLock = std::lock_guard<std::recursive_mutex>;
-
 template <class Event>
 std::vector<Event> GetEventsOf() {
-    Device const& device = Device::Get();
-    DeviceLock lock(device.mutex);
+    DeviceAccess const device;
     std::vector<Event> result;
-    for (RecordedEvent const& event : device.events) {
+    for (RecordedEvent const& event : device->events) {
         if (auto const* const found = std::get_if<Event>(&event)) result.push_back(*found);
     }
     return result;
@@ -31,31 +28,27 @@ std::vector<RecordedDraw> RecordingRenderer::GetDraws() { return GetEventsOf<Rec
 std::vector<RecordedClear> RecordingRenderer::GetClears() { return GetEventsOf<RecordedClear>(); }
 
 std::vector<RecordedEvent> RecordingRenderer::GetEvents() {
-    Device const& device = Device::Get();
-    DeviceLock lock(device.mutex);
-    return device.events;
+    DeviceAccess const device;
+    return device->events;
 }
 
 std::vector<RecordedEvent> RecordingRenderer::TakeEvents() {
-    Device& device = Device::Get();
-    DeviceLock lock(device.mutex);
-    return std::exchange(device.events, {});
+    DeviceAccess const device;
+    return std::exchange(device->events, {});
 }
 
 PipelineState RecordingRenderer::GetState() {
-    Device const& device = Device::Get();
-    DeviceLock lock(device.mutex);
-    return device.state;
+    DeviceAccess const device;
+    return device->state;
 }
 
 void RecordingRenderer::KeepRecords(bool keep) {
-    Device& device = Device::Get();
-    DeviceLock lock(device.mutex);
-    device.keepsRecords = keep;
+    DeviceAccess const device;
+    device->keepsRecords = keep;
     if (keep) return;
-    device.calls = {};
-    device.events = {};
-    device.FreeReleased();
+    device->calls = {};
+    device->events = {};
+    device->FreeReleased();
 }
 
 } // namespace Moka::Testing

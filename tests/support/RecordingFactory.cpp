@@ -14,14 +14,11 @@ using namespace Testing::detail;
 
 namespace {
 
-using DeviceLock = std::lock_guard<std::recursive_mutex>;
-
 class RecordingCaps final : public IRendererDeviceCaps {
 public:
     int GetMaxTextureSize() const override {
-        Device const& device = Device::Get();
-        DeviceLock lock(device.mutex);
-        return device.GetMaxTextureSize();
+        DeviceAccess const device;
+        return device->GetMaxTextureSize();
     }
     char const* GetVendor() const override { return IfAttached("Moka"); }
     char const* GetRenderer() const override { return IfAttached("recording renderer"); }
@@ -29,9 +26,8 @@ public:
 
 private:
     static char const* IfAttached(char const* text) {
-        Device const& device = Device::Get();
-        DeviceLock lock(device.mutex);
-        return device.attached ? text : "";
+        DeviceAccess const device;
+        return device->attached ? text : "";
     }
 };
 
@@ -96,28 +92,26 @@ IRenderTarget* AddTarget(Device& device, std::shared_ptr<Surface> surface, int w
 } // namespace
 
 bool RendererFactory::AttachContext(RendererLimits const& limits, RendererProcLoader) {
-    Device& device = Device::Get();
-    DeviceLock lock(device.mutex);
-    if (device.attached) {
+    DeviceAccess const device;
+    if (device->attached) {
         __android_log_print(ANDROID_LOG_ERROR, "mok_log",
                             "RendererFactory::AttachContext: a context is attached already");
         return false;
     }
-    device.attached = true;
-    ++device.context;
-    device.renderThread = std::this_thread::get_id();
-    device.limitedTextureSize = limits.maxTextureSize;
-    device.counters = {};
-    device.ForgetState();
+    device->attached = true;
+    ++device->context;
+    device->renderThread = std::this_thread::get_id();
+    device->limitedTextureSize = limits.maxTextureSize;
+    device->counters = {};
+    device->ForgetState();
     return true;
 }
 
 void RendererFactory::DetachContext() {
-    Device& device = Device::Get();
-    DeviceLock lock(device.mutex);
-    device.CheckThread("renderer", "DetachContext");
-    device.attached = false;
-    device.ForgetState();
+    DeviceAccess const device;
+    device->CheckThread("renderer", "DetachContext");
+    device->attached = false;
+    device->ForgetState();
 }
 
 IRendererDeviceCaps const* RendererFactory::GetRendererDeviceCaps() { return &theCaps; }
@@ -129,25 +123,24 @@ bool RendererFactory::IsGPUNameEqualTo(char const* name) {
 ITextureObject* RendererFactory::CreateTextureObject(TextureDescriptor const& descriptor,
                                                      TextureParameter const* parameters, int parameterCount,
                                                      PixelSource const& source) {
-    Device& device = Device::Get();
-    DeviceLock lock(device.mutex);
+    DeviceAccess const device;
     std::string const arguments = Describe(descriptor, source);
-    if (!device.MayCreate(ObjectKind::Texture, "CreateTextureObject", arguments)) return nullptr;
-    if (!IsValid(device, descriptor)) return nullptr;
-    std::shared_ptr<Surface> surface = ChooseSurface(device, descriptor);
+    if (!device->MayCreate(ObjectKind::Texture, "CreateTextureObject", arguments)) return nullptr;
+    if (!IsValid(*device, descriptor)) return nullptr;
+    std::shared_ptr<Surface> surface = ChooseSurface(*device, descriptor);
     if (!surface) return nullptr;
-    auto* const texture = device.Add<TextureState>(std::move(surface));
-    device.Record(texture->GetName(), "Create", arguments);
-    UploadSource(device, *texture, source);
+    auto* const texture = device->Add<TextureState>(std::move(surface));
+    device->Record(texture->GetName(), "Create", arguments);
+    UploadSource(*device, *texture, source);
     for (int i = 0; i < parameterCount; ++i) texture->SetParameter(parameters[i].id, parameters[i].value);
     return texture->GetObject();
 }
 
 IRenderTarget* RendererFactory::CreateOffscreenRenderTarget(ITextureObject* texture) {
-    Device& device = Device::Get();
-    DeviceLock lock(device.mutex);
+    DeviceAccess const device;
     std::string const arguments = RecordingRenderer::NameOf(texture);
-    if (!device.MayCreate(ObjectKind::RenderTarget, "CreateOffscreenRenderTarget", arguments)) return nullptr;
+    if (!device->MayCreate(ObjectKind::RenderTarget, "CreateOffscreenRenderTarget", arguments))
+        return nullptr;
     if (!texture) {
         __android_log_print(ANDROID_LOG_ERROR, "mok_log",
                             "RendererFactory::CreateOffscreenRenderTarget: no texture");
@@ -155,42 +148,39 @@ IRenderTarget* RendererFactory::CreateOffscreenRenderTarget(ITextureObject* text
     }
     TextureState const& state = static_cast<RecordingTexture const*>(texture)->GetState();
     if (state.released) {
-        device.Violate(state.GetName() + " made a target after its release");
+        device->Violate(state.GetName() + " made a target after its release");
         return nullptr;
     }
-    return AddTarget(device, state.surface, state.surface->width, state.surface->height, true, arguments);
+    return AddTarget(*device, state.surface, state.surface->width, state.surface->height, true, arguments);
 }
 
 IRenderTarget* RendererFactory::CreateRenderTargetFromDefault(int width, int height) {
-    Device& device = Device::Get();
-    DeviceLock lock(device.mutex);
+    DeviceAccess const device;
     std::string const arguments = Join("default", width, height);
-    if (!device.MayCreate(ObjectKind::RenderTarget, "CreateRenderTargetFromDefault", arguments))
+    if (!device->MayCreate(ObjectKind::RenderTarget, "CreateRenderTargetFromDefault", arguments))
         return nullptr;
-    if (!device.host) device.host = std::make_shared<Surface>(0, 0);
-    device.host->Grow(std::max(width, 0), std::max(height, 0));
-    return AddTarget(device, device.host, width, height, false, arguments);
+    if (!device->host) device->host = std::make_shared<Surface>(0, 0);
+    device->host->Grow(std::max(width, 0), std::max(height, 0));
+    return AddTarget(*device, device->host, width, height, false, arguments);
 }
 
 IRenderTarget* RendererFactory::CreateRenderTargetFromCurrent(int width, int height) {
-    Device& device = Device::Get();
-    DeviceLock lock(device.mutex);
+    DeviceAccess const device;
     std::string const arguments = Join("current", width, height);
-    if (!device.MayCreate(ObjectKind::RenderTarget, "CreateRenderTargetFromCurrent", arguments))
+    if (!device->MayCreate(ObjectKind::RenderTarget, "CreateRenderTargetFromCurrent", arguments))
         return nullptr;
-    if (device.active) {
-        return AddTarget(device, device.active->ShareSurface(), width, height, false, arguments);
+    if (device->active) {
+        return AddTarget(*device, device->active->ShareSurface(), width, height, false, arguments);
     }
-    if (!device.host) device.host = std::make_shared<Surface>(0, 0);
-    device.host->Grow(std::max(width, 0), std::max(height, 0));
-    return AddTarget(device, device.host, width, height, false, arguments);
+    if (!device->host) device->host = std::make_shared<Surface>(0, 0);
+    device->host->Grow(std::max(width, 0), std::max(height, 0));
+    return AddTarget(*device, device->host, width, height, false, arguments);
 }
 
 IDepthStencilBuffer* RendererFactory::CreateDepthStencilBuffer(int width, int height) {
-    Device& device = Device::Get();
-    DeviceLock lock(device.mutex);
+    DeviceAccess const device;
     std::string const arguments = Join(width, height);
-    if (!device.MayCreate(ObjectKind::DepthStencilBuffer, "CreateDepthStencilBuffer", arguments)) {
+    if (!device->MayCreate(ObjectKind::DepthStencilBuffer, "CreateDepthStencilBuffer", arguments)) {
         return nullptr;
     }
     if (width < 1 || height < 1) {
@@ -198,50 +188,44 @@ IDepthStencilBuffer* RendererFactory::CreateDepthStencilBuffer(int width, int he
                             "RendererFactory::CreateDepthStencilBuffer: %d x %d is empty", width, height);
         return nullptr;
     }
-    auto* const buffer = device.Add<RecordingBuffer>(width, height);
-    device.Record(buffer->GetName(), "Create", arguments);
+    auto* const buffer = device->Add<RecordingBuffer>(width, height);
+    device->Record(buffer->GetName(), "Create", arguments);
     return buffer;
 }
 
 IShaderProgram* RendererFactory::CreateShaderProgram(char const* vertexSource, char const* fragmentSource,
                                                      char const* name) {
-    Device& device = Device::Get();
-    DeviceLock lock(device.mutex);
-    device.CheckThread("renderer", "CreateShaderProgram");
+    DeviceAccess const device;
+    device->CheckThread("renderer", "CreateShaderProgram");
     char const* const label = name ? name : "";
-    auto* const program = device.Add<RecordingProgram>(vertexSource, fragmentSource, label);
-    device.Record(program->GetName(), "Create", label);
+    auto* const program = device->Add<RecordingProgram>(vertexSource, fragmentSource, label);
+    device->Record(program->GetName(), "Create", label);
     return program;
 }
 
 void RendererFactory::SetDeferred(bool on) {
-    Device& device = Device::Get();
-    DeviceLock lock(device.mutex);
-    device.RecordStatic("renderer", "SetDeferred", on);
+    DeviceAccess const device;
+    device->RecordStatic("renderer", "SetDeferred", on);
 }
 
 void RendererFactory::Flush() {
-    Device& device = Device::Get();
-    DeviceLock lock(device.mutex);
-    device.RecordStatic("renderer", "Flush");
+    DeviceAccess const device;
+    device->RecordStatic("renderer", "Flush");
 }
 
 void RendererFactory::Commit() {
-    Device& device = Device::Get();
-    DeviceLock lock(device.mutex);
-    device.RecordStatic("renderer", "Commit");
+    DeviceAccess const device;
+    device->RecordStatic("renderer", "Commit");
 }
 
 void RendererFactory::InvalidateState() {
-    Device& device = Device::Get();
-    DeviceLock lock(device.mutex);
-    device.RecordStatic("renderer", "InvalidateState");
+    DeviceAccess const device;
+    device->RecordStatic("renderer", "InvalidateState");
 }
 
 RendererStatistics RendererFactory::GetStatistics() {
-    Device const& device = Device::Get();
-    DeviceLock lock(device.mutex);
-    return device.CountObjects();
+    DeviceAccess const device;
+    return device->CountObjects();
 }
 
 } // namespace Moka

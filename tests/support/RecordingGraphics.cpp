@@ -111,11 +111,10 @@ using namespace Testing::detail;
 IGraphicsObject* RendererFactory::CreateGraphicsObject(int streams, PrimitiveType primitive,
                                                        VertexDescriptor const* descriptor, int indices,
                                                        int instanceStreams) {
-    Device& device = Device::Get();
-    std::lock_guard<std::recursive_mutex> lock(device.mutex);
+    DeviceAccess const device;
     int const floats = descriptor ? descriptor->GetFloatCount() : 0;
     std::string const arguments = Join(static_cast<int>(primitive), floats);
-    if (!device.MayCreate(ObjectKind::GraphicsObject, "CreateGraphicsObject", arguments)) return nullptr;
+    if (!device->MayCreate(ObjectKind::GraphicsObject, "CreateGraphicsObject", arguments)) return nullptr;
     if (streams != 1 || indices != 0 || instanceStreams != 0 || floats == 0) {
         __android_log_print(
             ANDROID_LOG_ERROR, "mok_log",
@@ -124,8 +123,8 @@ IGraphicsObject* RendererFactory::CreateGraphicsObject(int streams, PrimitiveTyp
             streams, floats, indices, instanceStreams);
         return nullptr;
     }
-    auto* const graphics = device.Add<RecordingGraphics>(primitive, floats);
-    device.Record(graphics->GetName(), "Create", arguments);
+    auto* const graphics = device->Add<RecordingGraphics>(primitive, floats);
+    device->Record(graphics->GetName(), "Create", arguments);
     return graphics;
 }
 

@@ -48,14 +48,13 @@ public:
 
     // No operation of the program, which may have been released before.
     ~RecordingParameter() override {
-        Device& device = Device::Get();
-        std::lock_guard<std::recursive_mutex> const lock(device.mutex);
-        if (device.keepsRecords) device.Record(mProgram.GetName(), "ReleaseParameter", mName);
-        if (device.attached && mProgram.context == device.context) {
-            device.CheckThread(mProgram.GetName(), "ReleaseParameter");
+        DeviceAccess const device;
+        if (device->keepsRecords) device->Record(mProgram.GetName(), "ReleaseParameter", mName);
+        if (device->attached && mProgram.context == device->context) {
+            device->CheckThread(mProgram.GetName(), "ReleaseParameter");
         }
         --mProgram.liveParameters;
-        device.FreeIfUnused(mProgram);
+        device->FreeIfUnused(mProgram);
     }
 
     void Set(void const* value) override {

@@ -1,6 +1,5 @@
 #include "tests/support/RecordingRenderer.h"
 
-#include "moka/base/Check.h"
 #include "tests/support/RecordingObjects.h"
 
 #include <algorithm>
@@ -10,8 +9,6 @@ namespace Moka::Testing {
 using namespace detail;
 
 namespace {
-
-using DeviceLock = std::lock_guard<std::recursive_mutex>;
 
 TextureState const& StateOf(ITextureObject const* texture) {
     return static_cast<RecordingTexture const*>(texture)->GetState();
@@ -24,88 +21,77 @@ std::string ToString(RecordedCall const& call) {
 }
 
 void RecordingRenderer::Reset() {
-    Device& device = Device::Get();
-    DeviceLock lock(device.mutex);
-    device.FreeReleased();
-    device.attached = false;
-    ++device.context; // what is still alive is left behind
-    device.deviceMaxTextureSize = kDefaultMaxTextureSize;
-    device.counters = {};
-    device.keepsRecords = true;
-    device.calls.clear();
-    device.events.clear();
-    device.violations.clear();
-    device.creations = 0;
-    device.failingCreations.clear();
-    device.failingKinds.clear();
-    device.lastNumber.clear();
-    device.ForgetState();
+    DeviceAccess const device;
+    device->FreeReleased();
+    device->attached = false;
+    ++device->context; // what is still alive is left behind
+    device->deviceMaxTextureSize = kDefaultMaxTextureSize;
+    device->counters = {};
+    device->keepsRecords = true;
+    device->calls.clear();
+    device->events.clear();
+    device->violations.clear();
+    device->creations = 0;
+    device->failingCreations.clear();
+    device->failingKinds.clear();
+    device->lastNumber.clear();
+    device->ForgetState();
 }
 
 std::vector<RecordedCall> RecordingRenderer::GetCalls() {
-    Device const& device = Device::Get();
-    DeviceLock lock(device.mutex);
-    return device.calls;
+    DeviceAccess const device;
+    return device->calls;
 }
 
 std::vector<std::string> RecordingRenderer::TakeCalls() {
-    Device& device = Device::Get();
-    DeviceLock lock(device.mutex);
+    DeviceAccess const device;
     std::vector<std::string> lines;
-    for (RecordedCall const& call : device.calls) lines.push_back(ToString(call));
-    device.calls.clear();
+    for (RecordedCall const& call : device->calls) lines.push_back(ToString(call));
+    device->calls.clear();
     return lines;
 }
 
 int RecordingRenderer::CountCalls(std::string const& operation) {
-    Device const& device = Device::Get();
-    DeviceLock lock(device.mutex);
+    DeviceAccess const device;
     return static_cast<int>(
-        std::count_if(device.calls.begin(), device.calls.end(),
+        std::count_if(device->calls.begin(), device->calls.end(),
                       [&](RecordedCall const& call) { return call.operation == operation; }));
 }
 
 std::vector<std::string> RecordingRenderer::GetViolations() {
-    Device const& device = Device::Get();
-    DeviceLock lock(device.mutex);
-    return device.violations;
+    DeviceAccess const device;
+    return device->violations;
 }
 
 void RecordingRenderer::SetMaxTextureSize(int texels) {
-    Device& device = Device::Get();
-    DeviceLock lock(device.mutex);
-    device.deviceMaxTextureSize = texels;
+    DeviceAccess const device;
+    device->deviceMaxTextureSize = texels;
 }
 
 void RecordingRenderer::FailCreation(int n) {
-    Device& device = Device::Get();
-    DeviceLock lock(device.mutex);
-    device.failingCreations.insert(device.creations + n);
+    DeviceAccess const device;
+    device->failingCreations.insert(device->creations + n);
 }
 
 void RecordingRenderer::FailCreations(ObjectKind kind) {
-    Device& device = Device::Get();
-    DeviceLock lock(device.mutex);
-    device.failingKinds.insert(kind);
+    DeviceAccess const device;
+    device->failingKinds.insert(kind);
 }
 
 void RecordingRenderer::StopFailing() {
-    Device& device = Device::Get();
-    DeviceLock lock(device.mutex);
-    device.failingCreations.clear();
-    device.failingKinds.clear();
+    DeviceAccess const device;
+    device->failingCreations.clear();
+    device->failingKinds.clear();
 }
 
 void RecordingRenderer::DeclareRenderThread() {
-    Device& device = Device::Get();
-    DeviceLock lock(device.mutex);
-    device.renderThread = std::this_thread::get_id();
+    DeviceAccess const device;
+    device->renderThread = std::this_thread::get_id();
 }
 
 void RecordingRenderer::DeclareNoRenderThread() {
-    Device& device = Device::Get();
-    DeviceLock lock(device.mutex);
-    device.renderThread = {};
+    DeviceAccess const device;
+    device->renderThread = {};
 }
 
 std::string RecordingRenderer::NameOf(ITextureObject const* texture) {
@@ -125,65 +111,44 @@ std::string RecordingRenderer::NameOf(IShaderProgram const* program) {
 }
 
 std::vector<unsigned char> RecordingRenderer::GetTexels(ITextureObject const* texture) {
-    DeviceLock lock(Device::Get().mutex);
+    DeviceAccess const device;
     return StateOf(texture).surface->pixels;
 }
 
-void RecordingRenderer::SetTexels(ITextureObject* texture, std::vector<unsigned char> const& pixels) {
-    DeviceLock lock(Device::Get().mutex);
-    Surface& surface = *StateOf(texture).surface;
-    MOKA_CHECK(pixels.size() == surface.pixels.size(), "the pixels are not the texture's size");
-    surface.pixels = pixels;
-}
-
-std::vector<unsigned char> RecordingRenderer::GetTexels(IRenderTarget const* target) {
-    DeviceLock lock(Device::Get().mutex);
-    return static_cast<RecordingTarget const*>(target)->GetSurface()->pixels;
-}
-
 int RecordingRenderer::GetParameter(ITextureObject const* texture, int id) {
-    DeviceLock lock(Device::Get().mutex);
+    DeviceAccess const device;
     auto const& parameters = StateOf(texture).parameters;
     auto const found = parameters.find(id);
     return found == parameters.end() ? -1 : found->second;
 }
 
 std::string RecordingRenderer::GetActiveTarget() {
-    Device const& device = Device::Get();
-    DeviceLock lock(device.mutex);
-    return NameOf(device.active);
+    DeviceAccess const device;
+    return NameOf(device->active);
 }
 
 std::string RecordingRenderer::GetCurrentProgram() {
-    Device const& device = Device::Get();
-    DeviceLock lock(device.mutex);
-    return NameOf(device.currentProgram);
+    DeviceAccess const device;
+    return NameOf(device->currentProgram);
 }
 
 std::string RecordingRenderer::GetParameter(IShaderProgram const* program, std::string const& name) {
-    DeviceLock lock(Device::Get().mutex);
+    DeviceAccess const device;
     auto const& values = static_cast<RecordingProgram const*>(program)->values;
     auto const found = values.find(name);
     return found == values.end() ? std::string() : Join(found->second);
 }
 
 std::string RecordingRenderer::GetBoundTexture(int unit) {
-    Device const& device = Device::Get();
-    DeviceLock lock(device.mutex);
-    auto const found = device.boundTextures.find(unit);
-    return found == device.boundTextures.end() ? "none" : found->second->GetName();
-}
-
-std::string RecordingRenderer::GetAttachedBuffer(IRenderTarget const* target) {
-    DeviceLock lock(Device::Get().mutex);
-    return NameOf(static_cast<RecordingTarget const*>(target)->GetAttached());
+    DeviceAccess const device;
+    auto const found = device->boundTextures.find(unit);
+    return found == device->boundTextures.end() ? "none" : found->second->GetName();
 }
 
 int RecordingRenderer::CountLiveObjects() {
-    Device const& device = Device::Get();
-    DeviceLock lock(device.mutex);
+    DeviceAccess const device;
     int count = 0;
-    for (auto const& object : device.objects) {
+    for (auto const& object : device->objects) {
         if (!object->released) ++count;
         if (object->kind != ObjectKind::Program) continue;
         count += static_cast<RecordingProgram const&>(*object).liveParameters;

@@ -103,9 +103,6 @@ public:
 
     // The image, rows packed, in texture order. Not recorded, allowed on any thread and after release.
     static std::vector<unsigned char> GetTexels(ITextureObject const* texture);
-    static void SetTexels(ITextureObject* texture, std::vector<unsigned char> const& pixels);
-    // The image of the target: the texture's own, or the host's frame buffer, bottom row first.
-    static std::vector<unsigned char> GetTexels(IRenderTarget const* target);
 
     // The value last set, or the initial one; -1 for an id that names no parameter.
     static int GetParameter(ITextureObject const* texture, int id);
@@ -115,7 +112,6 @@ public:
     static std::string GetActiveTarget();
     static std::string GetCurrentProgram();
     static std::string GetBoundTexture(int unit);
-    static std::string GetAttachedBuffer(IRenderTarget const* target);
 
     // What a uniform was set to last: its numbers, separated by spaces; empty before.
     static std::string GetParameter(IShaderProgram const* program, std::string const& name);

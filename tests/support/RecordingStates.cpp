@@ -10,8 +10,6 @@
 namespace Moka::Testing::detail {
 namespace {
 
-using DeviceLock = std::lock_guard<std::recursive_mutex>;
-
 int ToNumber(BlendingFactor factor) { return static_cast<int>(factor); }
 
 class RecordingBlendState final : public ObjectState, public IBlendStateObject {
@@ -94,32 +92,30 @@ private:
 class RecordingRasterizer final : public IRasterizerState {
 public:
     bool IsScissorEnabled() override {
-        DeviceLock lock(Device::Get().mutex);
+        DeviceAccess const device;
         return Ask("IsScissorEnabled").scissorOn;
     }
 
     void SetScissorEnabled(bool on) override {
-        Device& device = Device::Get();
-        DeviceLock lock(device.mutex);
-        device.RecordStatic("rasterizer", "SetScissorEnabled", on);
-        if (device.state.scissorOn == on) return;
-        device.state.scissorOn = on;
-        ++device.counters.scissorChanges;
+        DeviceAccess const device;
+        device->RecordStatic("rasterizer", "SetScissorEnabled", on);
+        if (device->state.scissorOn == on) return;
+        device->state.scissorOn = on;
+        ++device->counters.scissorChanges;
     }
 
     ScissorRect GetScissorRect() override {
-        DeviceLock lock(Device::Get().mutex);
+        DeviceAccess const device;
         return Ask("GetScissorRect").scissor;
     }
 
     void SetScissorRect(ScissorRect const& rect) override {
-        Device& device = Device::Get();
-        DeviceLock lock(device.mutex);
-        device.RecordStatic("rasterizer", "SetScissorRect", rect.x, rect.y, rect.width, rect.height);
+        DeviceAccess const device;
+        device->RecordStatic("rasterizer", "SetScissorRect", rect.x, rect.y, rect.width, rect.height);
         ScissorRect const next = {rect.x, rect.y, std::max(rect.width, 0), std::max(rect.height, 0)};
-        if (device.state.scissor == next) return;
-        device.state.scissor = next;
-        ++device.counters.scissorChanges;
+        if (device->state.scissor == next) return;
+        device->state.scissor = next;
+        ++device->counters.scissorChanges;
     }
 
 private:
@@ -141,34 +137,31 @@ using namespace Testing;
 using namespace Testing::detail;
 
 IBlendStateObject* RendererFactory::CreateBlendStateObject(BlendStateDescriptor const& descriptor) {
-    Device& device = Device::Get();
-    DeviceLock lock(device.mutex);
+    DeviceAccess const device;
     std::string const arguments = Join(descriptor.IsBlending(), descriptor.IsColorWrite());
-    if (!device.MayCreate(ObjectKind::BlendState, "CreateBlendStateObject", arguments)) return nullptr;
-    auto* const state = device.Add<RecordingBlendState>(descriptor);
-    device.Record(state->GetName(), "Create", arguments);
+    if (!device->MayCreate(ObjectKind::BlendState, "CreateBlendStateObject", arguments)) return nullptr;
+    auto* const state = device->Add<RecordingBlendState>(descriptor);
+    device->Record(state->GetName(), "Create", arguments);
     return state;
 }
 
 IDepthStencilState* RendererFactory::CreateDepthStencilState(DepthStencilStateDescriptor const& descriptor) {
-    Device& device = Device::Get();
-    DeviceLock lock(device.mutex);
+    DeviceAccess const device;
     std::string const arguments = Join(descriptor.IsDepth(), descriptor.IsStencil());
-    if (!device.MayCreate(ObjectKind::DepthStencilState, "CreateDepthStencilState", arguments)) {
+    if (!device->MayCreate(ObjectKind::DepthStencilState, "CreateDepthStencilState", arguments)) {
         return nullptr;
     }
-    auto* const state = device.Add<RecordingDepthStencilState>(descriptor);
-    device.Record(state->GetName(), "Create", arguments);
+    auto* const state = device->Add<RecordingDepthStencilState>(descriptor);
+    device->Record(state->GetName(), "Create", arguments);
     return state;
 }
 
 IRasterizerState* RendererFactory::GetRasterizerState() { return &theRasterizer; }
 
 void RendererFactory::SetStencilClip(bool on) {
-    Device& device = Device::Get();
-    DeviceLock lock(device.mutex);
-    device.RecordStatic("renderer", "SetStencilClip", on);
-    device.state.stencilClip = on;
+    DeviceAccess const device;
+    device->RecordStatic("renderer", "SetStencilClip", on);
+    device->state.stencilClip = on;
 }
 
 } // namespace Moka

@@ -78,11 +78,10 @@ RecordingTexture::~RecordingTexture() {
 }
 
 void RecordingTexture::operator delete(void* memory) {
-    Device& device = Device::Get();
-    std::lock_guard<std::recursive_mutex> lock(device.mutex);
-    TextureState& state = *device.texturesByAddress.at(memory);
+    DeviceAccess const device;
+    TextureState& state = *device->texturesByAddress.at(memory);
     ::new (memory) RecordingTexture(state);
-    device.FreeIfUnused(state);
+    device->FreeIfUnused(state);
 }
 
 void RecordingTexture::SetLabel(char const* text) {

@@ -41,15 +41,17 @@ protected:
     std::vector<int> mOrder;
 };
 
-TEST_F(HandPumpedQueueTest, RunsInPostingOrderAndFreesEachOnce) {
+TEST_F(HandPumpedQueueTest, RunsInPostingOrderAndFreesEachOnceAlsoWhatThrows) {
+    int freedAfter = -1;
     HandPumpedQueue queue;
     queue.Post(MakeTask([&] {
         mOrder.push_back(1);
         queue.Post(MakeTask([&] { mOrder.push_back(3); }));
+        queue.WaitForTasks(); // a deadlock elsewhere
+        EXPECT_EQ(queue.GetPendingCount(), 2);
     }));
     queue.Post(nullptr);
     queue.Post(MakeTask([&] { mOrder.push_back(2); }));
-    EXPECT_TRUE(mOrder.empty());
     EXPECT_TRUE(queue.RunOne());
     EXPECT_EQ(mFreed, 1);
     queue.WaitForTasks();
@@ -60,40 +62,16 @@ TEST_F(HandPumpedQueueTest, RunsInPostingOrderAndFreesEachOnce) {
     EXPECT_EQ(queue.GetNullCount(), 1);
     EXPECT_EQ(queue.GetWaitCount(), 1);
     EXPECT_FALSE(queue.RunOne());
-}
 
-TEST_F(HandPumpedQueueTest, AWaitInsideATaskRunsNothingAndIsCountedApart) {
-    HandPumpedQueue queue;
-    queue.Post(MakeTask([&] {
-        queue.WaitForTasks();
-        EXPECT_EQ(queue.GetPendingCount(), 1);
-    }));
-    queue.Post(MakeTask());
-    EXPECT_EQ(queue.RunAll(), 2);
-    EXPECT_EQ(queue.GetWaitInsideTaskCount(), 1);
-    EXPECT_EQ(queue.GetWaitCount(), 0);
-}
-
-TEST_F(HandPumpedQueueTest, TheTaskRunsAndDiesBetweenTheCallsAroundItEvenWhenItThrows) {
-    HandPumpedQueue queue;
-    int freedAfter = -1;
-    bool inside = false;
-    queue.SetAroundRun([&] { inside = true; },
-                       [&] {
-                           inside = false;
-                           freedAfter = mFreed;
-                       });
-    queue.Post(MakeTask([&] {
-        EXPECT_TRUE(inside);
-        throw std::runtime_error("task");
-    }));
+    queue.SetAroundRun([&] { mOrder.push_back(4); }, [&] { freedAfter = mFreed; });
+    queue.Post(MakeTask([] { throw std::runtime_error("task"); }));
     EXPECT_THROW(queue.RunAll(), std::runtime_error);
-    EXPECT_FALSE(inside);
-    EXPECT_EQ(freedAfter, 1);
+    EXPECT_EQ(mOrder.back(), 4);
+    EXPECT_EQ(freedAfter, 4);
 }
 
 TEST_F(HandPumpedQueueTest, TasksNeverRunAreFreedWithTheQueueAndRefusedOnesStayWithTheCaller) {
-    ITask* const refused = MakeTask([&] { mOrder.push_back(2); });
+    ITask* const refused = MakeTask();
     {
         RefusingQueue queue(std::set<int>{2});
         EXPECT_TRUE(queue.Post(MakeTask([&] { mOrder.push_back(1); })));
@@ -105,8 +83,7 @@ TEST_F(HandPumpedQueueTest, TasksNeverRunAreFreedWithTheQueueAndRefusedOnesStayW
     }
     EXPECT_THAT(mOrder, ElementsAre(1));
     EXPECT_EQ(mFreed, 2);
-    RefusingQueue never;
-    EXPECT_FALSE(never.Post(refused));
+    EXPECT_FALSE(RefusingQueue().Post(refused));
     delete refused;
     EXPECT_EQ(mFreed, 3);
 }
@@ -119,7 +96,6 @@ TEST(LogCaptureTest, TheInnerCaptureTakesTheLinesOfItsScopeOnly) {
         __android_log_print(ANDROID_LOG_ERROR, "tag", "inner %s", "text");
         EXPECT_EQ(inner.Count(ANDROID_LOG_ERROR, "ner te"), 1);
         EXPECT_EQ(inner.Count(ANDROID_LOG_INFO), 0);
-        EXPECT_TRUE(inner.Has("inner text"));
         EXPECT_FALSE(inner.Has("inner"));
         EXPECT_EQ(inner.Find("inner text").tag, "tag");
     }
@@ -128,25 +104,9 @@ TEST(LogCaptureTest, TheInnerCaptureTakesTheLinesOfItsScopeOnly) {
 }
 
 TEST(TestImagesTest, TheGradientRepeatsNoPixelAcrossItsByteBoundaries) {
-    TestImage const image = MakeGradient(520, 517);
     std::set<Color> seen;
-    for (int y = 0; y < image.height; ++y) {
-        for (int x = 0; x < image.width; ++x) seen.insert(image.GetColor(x, y));
-    }
+    for (int i = 0; i < 520 * 517; ++i) seen.insert(GetGradientColor(i % 520, i / 520));
     EXPECT_EQ(seen.size(), 520u * 517u);
-    EXPECT_EQ(image.Crop(300, 400, 2, 2).GetColor(1, 1), GetGradientColor(301, 401));
-}
-
-TEST(TestImagesTest, TransparentImagesArePremultiplied) {
-    for (TestImage const& image : {MakeAlphaPattern(64, 64), MakeInkPage(320, 200)}) {
-        std::set<int> alphas;
-        for (std::size_t i = 0; i < image.pixels.size(); i += 4) {
-            unsigned char const* const pixel = image.pixels.data() + i;
-            ASSERT_TRUE(pixel[0] <= pixel[3] && pixel[1] <= pixel[3] && pixel[2] <= pixel[3]) << i;
-            alphas.insert(pixel[3]);
-        }
-        EXPECT_GE(alphas.size(), image.width == 64 ? 256u : 50u);
-    }
 }
 
 TEST(ImageCompareTest, ReportsHowManyHowFarAndWhere) {

@@ -1,5 +1,5 @@
+#include "tests/support/RecordingThread.h"
 #include "tests/trust/MixedWork.h"
-#include "tests/trust/RecordingThread.h"
 #include "tests/trust/Soak.h"
 
 namespace Moka::Testing {

@@ -9,9 +9,9 @@
 #include "moka/renderer/RendererFactory.h"
 #include "tests/support/LogCapture.h"
 #include "tests/support/RecordingRenderer.h"
+#include "tests/support/RecordingThread.h"
 #include "tests/support/TestImages.h"
 #include "tests/trust/MixedWork.h"
-#include "tests/trust/RecordingThread.h"
 
 #include <atomic>
 #include <filesystem>

@@ -122,7 +122,6 @@ JNIEXPORT jdoubleArray JNICALL Java_moka_Host_readDisplay(JNIEnv* env, jclass, j
 }
 
 JNIEXPORT jstring JNICALL Java_moka_Host_loadDrawSave(JNIEnv* env, jclass, jstring from, jstring to) {
-    Testing::Journey journey(javaVm);
-    return env->NewStringUTF(journey.Travel(ToString(env, from), ToString(env, to)).c_str());
+    return env->NewStringUTF(Testing::LoadDrawSave(javaVm, ToString(env, from), ToString(env, to)).c_str());
 }
 }

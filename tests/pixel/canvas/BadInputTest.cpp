@@ -32,15 +32,9 @@ void DrawSomething(IMKCanvas& canvas) {
     canvas.DrawLine(5, 40, 40, 42, &paint);
 }
 
-RefPtr<IMKBitmap> MakeBitmap(Scenes::SceneStage& stage) {
-    Scenes::Picture picture(20, 20);
-    picture.pixels = MakeBackdrop(20, 20).pixels;
-    return RefPtr<IMKBitmap>::Adopt(stage.MakeBitmap(picture));
-}
-
 void DrawOneOfEach(IMKCanvas& canvas, Scenes::SceneStage& stage, float a, float b) {
     MKPaint const paint = MakePaint();
-    auto const bitmap = MakeBitmap(stage);
+    auto const bitmap = MakeBitmap(stage, MakeBackdrop(20, 20));
     canvas.DrawRect(a, 5, b, 30, &paint);
     canvas.DrawRoundRect(a, 5, b, 30, 4, 6, &paint);
     canvas.DrawRoundRect(4, 5, 40, 30, a, b, &paint);
@@ -109,7 +103,7 @@ TEST_F(BadInputTest, NullsEmptyListsAndPicturesOutsideDisturbNothing) {
     ExpectNextDrawRight(
         [](IMKCanvas& canvas, Scenes::SceneStage& stage) {
             std::vector<PointF> none;
-            auto const bitmap = MakeBitmap(stage);
+            auto const bitmap = MakeBitmap(stage, MakeBackdrop(20, 20));
             canvas.Draw(nullptr, nullptr);
             canvas.DrawBitmap(nullptr, 0, 0, nullptr);
             canvas.DrawBitmap(nullptr, RectF(0, 0, 5, 5), nullptr);
@@ -148,7 +142,7 @@ TEST_F(BadInputTest, WhatHasAnAnswerDrawsIt) {
     ExpectLikeReference(
         {MakeBackdrop(60, 60),
          [](IMKCanvas& canvas, Scenes::SceneStage& stage) {
-             auto const bitmap = MakeBitmap(stage);
+             auto const bitmap = MakeBitmap(stage, MakeBackdrop(20, 20));
              MKPaint const paint = MakePaint();
              canvas.DrawRoundRect(4, 4, 24, 20, -3, 4, &paint); // a plain one
              canvas.DrawBitmap(bitmap.Get(), RectF(-10, -10, 12, 40), RectF(30, 2, 58, 30), nullptr);
@@ -183,7 +177,7 @@ TEST_F(BadInputTest, APostedDrawHasItsOwnCopyOfEverything) {
     TestImage const start(40, 40);
     std::vector<RectF> const places{RectF(2, 22, 12, 32)};
     auto const draw = [&](IMKCanvas& canvas, Scenes::SceneStage& stage, bool disturb) {
-        auto bitmap = MakeBitmap(stage);
+        auto bitmap = MakeBitmap(stage, MakeBackdrop(20, 20));
         MKPaint paint = MakePaint(MKPaint::Fill);
         std::vector<PointF> points{{20, 20}, {35, 30}};
         std::vector<RectF> dsts = places;

@@ -34,12 +34,6 @@ TestImage MakeDestination() {
     return image;
 }
 
-Scenes::Picture ToPicture(TestImage const& image) {
-    Scenes::Picture picture(image.width, image.height);
-    picture.pixels = image.pixels;
-    return picture;
-}
-
 MKPaint MakePaint(int mode) {
     MKPaint paint;
     paint.SetXFermode(static_cast<MKPaint::XFermode>(mode));
@@ -79,8 +73,7 @@ TEST_P(EveryMode, BlendsBitmapsByItsEquation) {
         if (tinted) paint.SetTintColor(0.2f, 0.9f, 0.5f, 0.7f);
         ExpectLikeReference({MakeDestination(),
                              [&](IMKCanvas& canvas, Scenes::SceneStage& stage) {
-                                 auto const bitmap =
-                                     RefPtr<IMKBitmap>::Adopt(stage.MakeBitmap(ToPicture(MakeSource())));
+                                 auto const bitmap = MakeBitmap(stage, MakeSource());
                                  canvas.DrawBitmap(bitmap.Get(), 0, 0, &paint);
                              }},
                             "bitmaps in mode " + std::to_string(GetParam()) + (tinted ? " tinted" : ""));
@@ -99,8 +92,7 @@ TEST_F(BlendTest, DarkenAndLightenSeeTheDestinationUnderEveryClipAndStrip) {
             MKPaint const paint = MakePaint(mode);
             ExpectLikeReference({MakeBackdrop(60, 150),
                                  [&](IMKCanvas& canvas, Scenes::SceneStage& stage) {
-                                     auto const bitmap =
-                                         RefPtr<IMKBitmap>::Adopt(stage.MakeBitmap(ToPicture(MakeSource())));
+                                     auto const bitmap = MakeBitmap(stage, MakeSource());
                                      canvas.DrawBitmap(bitmap.Get(), 3, 5, &paint);
                                      canvas.SetClipRect(10, 20, 30, 100, IMKCanvasBase::Intersect);
                                      canvas.DrawBitmap(bitmap.Get(), 3, 14, &paint);

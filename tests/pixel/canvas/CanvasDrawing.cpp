@@ -3,6 +3,7 @@
 #include "moka/base/log/AndroidLog.h"
 #include "moka/graphics/bitmap/MKGraphicsFactory.h"
 #include "moka/renderer/RendererFactory.h"
+#include "tests/support/NothingLeft.h"
 
 #include <cstring>
 #include <memory>
@@ -98,17 +99,19 @@ TestImage MakeBackdrop(int width, int height) {
     return image;
 }
 
+RefPtr<IMKBitmap> MakeBitmap(Scenes::SceneStage& stage, TestImage const& image) {
+    Scenes::Picture picture(image.width, image.height);
+    picture.pixels = image.pixels;
+    return RefPtr<IMKBitmap>::Adopt(stage.MakeBitmap(picture));
+}
+
 void CanvasDrawing::UseLargestSide(int side) { mSide = side; }
 
 RenderThread& CanvasDrawing::GetRenderThread() const { return *GetRenderer().Use(mSide); }
 
 void CanvasDrawing::TearDown() {
     GetRenderThread().WaitForTasks();
-    RendererStatistics const s = RendererFactory::GetStatistics();
-    EXPECT_LE(s.textures + s.frameBuffers + s.renderBuffers, kept);
-    EXPECT_EQ(s.textureObjects + s.renderTargets + s.depthStencilBuffers, 0);
-    EXPECT_EQ(s.programs + s.graphicsObjects + s.stateObjects, 0);
-    EXPECT_EQ(s.errors, 0u);
+    ExpectNothingLeft(RendererFactory::GetStatistics(), kept);
     for (std::string const& line : log.GetTexts(ANDROID_LOG_ERROR)) ADD_FAILURE() << line;
     if (kept > 0) GetRenderer().Stop();
 }

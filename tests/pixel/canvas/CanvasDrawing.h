@@ -39,6 +39,9 @@ struct ReferencePicture {
 // Every alpha, with colours of its own, so that every blend shows.
 TestImage MakeBackdrop(int width, int height);
 
+// On the drawing's own stage.
+RefPtr<IMKBitmap> MakeBitmap(Scenes::SceneStage& stage, TestImage const& image);
+
 class CanvasDrawing : public ::testing::Test {
 protected:
     static constexpr int kLarge = 4096;

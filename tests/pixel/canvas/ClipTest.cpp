@@ -33,9 +33,20 @@ MKPaint MakePaint() {
     return paint;
 }
 
-class ClipTest : public CanvasDrawing {
-protected:
-    void ExpectOps(std::vector<Ops> const& all) {
+class ClipTest : public CanvasDrawing {};
+
+TEST_F(ClipTest, PairsAndTriplesLeaveTheirSetOnOneStripAndOnThree) {
+    using C = IMKCanvasBase;
+    std::vector<Ops> all{
+        {C::Intersect, C::Union, C::Difference},    {C::Replace, C::Xor, C::ReverseDifference},
+        {C::Union, C::Replace, C::Intersect},       {C::Replace, C::Union, C::Union},
+        {C::Difference, C::Difference, C::Xor},     {C::ReverseDifference, C::Union, C::Replace},
+        {C::Intersect, C::Intersect, C::Intersect}, {C::Xor, C::Xor, C::ReverseDifference}};
+    for (int pair = 0; pair < 49; ++pair) {
+        all.push_back({static_cast<C::ClipOp>(pair / 7), static_cast<C::ClipOp>(pair % 7)});
+    }
+    for (int const side : {kLarge, 64}) {
+        UseLargestSide(side);
         for (Ops const& ops : all) {
             for (float const degrees : {0.0f, 7.5f}) {
                 ExpectLikeReference({MakeBackdrop(kWidth, kHeight),
@@ -48,38 +59,6 @@ protected:
             }
         }
     }
-
-    static std::vector<Ops> MakePairs() {
-        std::vector<Ops> all;
-        for (int first = 0; first < 7; ++first) {
-            for (int second = 0; second < 7; ++second) {
-                all.push_back(
-                    {static_cast<IMKCanvasBase::ClipOp>(first), static_cast<IMKCanvasBase::ClipOp>(second)});
-            }
-        }
-        return all;
-    }
-
-    static std::vector<Ops> MakeTriples() {
-        using C = IMKCanvasBase;
-        return {{C::Intersect, C::Union, C::Difference},    {C::Replace, C::Xor, C::ReverseDifference},
-                {C::Union, C::Replace, C::Intersect},       {C::Replace, C::Union, C::Union},
-                {C::Difference, C::Difference, C::Xor},     {C::ReverseDifference, C::Union, C::Replace},
-                {C::Intersect, C::Intersect, C::Intersect}, {C::Xor, C::Xor, C::ReverseDifference}};
-    }
-};
-
-TEST_F(ClipTest, PairsLeaveTheirSetOnOneStrip) { ExpectOps(MakePairs()); }
-
-TEST_F(ClipTest, PairsLeaveTheirSetOnThreeStrips) {
-    UseLargestSide(64);
-    ExpectOps(MakePairs());
-}
-
-TEST_F(ClipTest, TriplesLeaveTheirSetOnOneStripAndOnThree) {
-    ExpectOps(MakeTriples());
-    UseLargestSide(64);
-    ExpectOps(MakeTriples());
 }
 
 TEST_F(ClipTest, StraightClipsCutFractionsTowardsZero) {
@@ -107,9 +86,7 @@ void DrawOneOfEach(IMKCanvas& canvas, Scenes::SceneStage& stage) {
     stroke.SetLineWidth(5);
     MKPaint darken = paint;
     darken.SetXFermode(MKPaint::Darken);
-    Scenes::Picture picture(20, 20);
-    picture.pixels = MakeBackdrop(20, 20).pixels;
-    auto const bitmap = RefPtr<IMKBitmap>::Adopt(stage.MakeBitmap(picture));
+    auto const bitmap = MakeBitmap(stage, MakeBackdrop(20, 20));
     canvas.DrawRect(4, 4, 30, 20, &paint);
     canvas.DrawRect(36, 6, 58, 20, &stroke);
     canvas.DrawRoundRect(4, 26, 30, 46, 6, 6, &paint);
@@ -173,9 +150,7 @@ TEST_F(ClipTest, BatchesObeyStraightClipsAndPassStencilClips) {
         ExpectLikeReference(
             {MakeBackdrop(kWidth, 60),
              [&](IMKCanvas& canvas, Scenes::SceneStage& stage) {
-                 Scenes::Picture picture(20, 20);
-                 picture.pixels = MakeBackdrop(20, 20).pixels;
-                 auto const bitmap = RefPtr<IMKBitmap>::Adopt(stage.MakeBitmap(picture));
+                 auto const bitmap = MakeBitmap(stage, MakeBackdrop(20, 20));
                  canvas.SetClipRect(10, 10, 30, 40, IMKCanvasBase::Intersect);
                  if (!straight) canvas.SetClipRect(5, 5, 10, 10, IMKCanvasBase::Union);
                  canvas.DrawBitmaps(bitmap.Get(), {RectF(0, 0, 30, 30), RectF(20, 25, 62, 58)}, nullptr);

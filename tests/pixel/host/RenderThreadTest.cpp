@@ -6,6 +6,7 @@
 #include "moka/renderer/IRendererDeviceCaps.h"
 #include "moka/renderer/ITextureObject.h"
 #include "tests/support/LogCapture.h"
+#include "tests/support/NothingLeft.h"
 
 #include <gmock/gmock.h>
 
@@ -24,27 +25,41 @@ using testing::StartsWith;
 
 using Pixel = std::array<unsigned char, 4>;
 
-std::unique_ptr<RenderThread> MustStart(RenderThreadOptions const& options = {}) {
+// Ended with its renderer empty and without complaints from the driver.
+struct Finish {
+    void operator()(RenderThread* thread) const {
+        std::unique_ptr<RenderThread> const owned(thread);
+        thread->Call([] { RendererFactory::Flush(); });
+        ExpectNothingLeft(RendererFactory::GetStatistics()); // of a stopped one's as well
+    }
+};
+using ThreadPtr = std::unique_ptr<RenderThread, Finish>;
+
+ThreadPtr MustStart(RenderThreadOptions const& options = {{}, true, 1, 1}) {
     std::string error;
-    std::unique_ptr<RenderThread> thread = RenderThread::Start(options, &error);
+    ThreadPtr thread(RenderThread::Start(options, &error).release());
     EXPECT_TRUE(thread) << error;
     return thread;
 }
 
-// Clears the target to opaque orange and reads one pixel of it. On the render thread.
-Pixel ClearAndRead(IRenderTarget* target, int x, int y) {
-    Pixel pixel{};
-    if (!target) return pixel;
-    target->ClearColor(1.0f, 0.4f, 0.0f, 1.0f);
-    target->ReadPixels(x, y, 1, 1, {pixel.data(), 1, 0, 0});
-    target->Release();
-    return pixel;
+class RenderThreadTest : public ::testing::Test {
+protected:
+    void TearDown() override { EXPECT_THAT(log.GetTexts(ANDROID_LOG_ERROR), IsEmpty()); }
+
+    LogCapture log;
+};
+
+// 8 x 8, like what follows on the render thread.
+ITextureObject* MakeTexture() {
+    return RendererFactory::CreateTextureObject(TextureDescriptor(8, 8, 0, 2, 6, 1, false, nullptr), nullptr,
+                                                0, {});
 }
+
 constexpr Pixel kOrange = {255, 102, 0, 255};
 
-TEST(RenderThreadTest, StartsStopsAndStartsAgain) {
+TEST_F(RenderThreadTest, StartsStopsAndStartsAgain) {
     for (int round = 0; round < 3; ++round) {
-        std::unique_ptr<RenderThread> const thread = MustStart();
+        ThreadPtr const thread = MustStart();
         ASSERT_TRUE(thread);
         RenderContextInfo const& info = thread->GetContextInfo();
         EXPECT_THAT(info.path, StartsWith("EGL "));
@@ -58,9 +73,11 @@ TEST(RenderThreadTest, StartsStopsAndStartsAgain) {
 
         Pixel pixel{};
         EXPECT_TRUE(thread->Call([&pixel] {
-            ITextureObject* const texture = RendererFactory::CreateTextureObject(
-                TextureDescriptor(8, 8, 0, 2, 6, 1, false, 0), nullptr, 0, {});
-            pixel = ClearAndRead(RendererFactory::CreateOffscreenRenderTarget(texture), 7, 7);
+            ITextureObject* const texture = MakeTexture();
+            IRenderTarget* const target = RendererFactory::CreateOffscreenRenderTarget(texture);
+            target->ClearColor(1.0f, 0.4f, 0.0f, 1.0f);
+            target->ReadPixels(7, 7, 1, 1, {pixel.data(), 1, 0, 0});
+            target->Release();
             delete texture;
         }));
         EXPECT_EQ(pixel, kOrange);
@@ -71,50 +88,30 @@ TEST(RenderThreadTest, StartsStopsAndStartsAgain) {
     }
 }
 
-TEST(RenderThreadTest, TurnsAwayASecondOneAndTheFirstGoesOn) {
-    std::unique_ptr<RenderThread> first = MustStart({{}, false, 4, 4});
+TEST_F(RenderThreadTest, TurnsAwayASecondOneAndTheFirstGoesOnWithItsDefaultFrameBuffer) {
+    ThreadPtr first = MustStart({{}, true, 64, 1});
     ASSERT_TRUE(first);
     std::string error;
     EXPECT_EQ(RenderThread::Start({}, &error), nullptr);
     EXPECT_THAT(error, HasSubstr("stop it first"));
+    EXPECT_EQ(RenderThread::Start({{}, false, 0, 16}, &error), nullptr);
+    EXPECT_THAT(error, HasSubstr("0 x 16"));
 
-    Pixel pixel{};
-    first->Call([&] { pixel = ClearAndRead(RendererFactory::CreateRenderTargetFromDefault(4, 4), 2, 2); });
-    EXPECT_EQ(pixel, kOrange);
-    first.reset();
-    EXPECT_TRUE(MustStart());
-}
-
-TEST(RenderThreadTest, GivesADefaultFrameBufferOfTheSizeAskedFor) {
-    std::unique_ptr<RenderThread> const thread = MustStart({{}, false, 64, 1});
-    ASSERT_TRUE(thread);
-    EXPECT_THAT(thread->GetContextInfo().path, HasSubstr("pbuffer 64 x 1"));
+    EXPECT_THAT(first->GetContextInfo().path, HasSubstr("pbuffer 64 x 1"));
     std::array<Pixel, 64> row{};
-    thread->Call([&] {
+    first->Call([&] {
         IRenderTarget* const target = RendererFactory::CreateRenderTargetFromDefault(64, 1);
         target->ClearColor(1.0f, 0.4f, 0.0f, 1.0f);
         target->ReadPixels(0, 0, 64, 1, {row.data(), 64, 0, 0});
         target->Release();
     });
     EXPECT_THAT(row, Each(kOrange));
+    first.reset();
+    EXPECT_TRUE(MustStart());
 }
 
-TEST(RenderThreadTest, RefusesASurfaceThatHasNoPixels) {
-    std::string error;
-    EXPECT_EQ(RenderThread::Start({{}, false, 0, 16}, &error), nullptr);
-    EXPECT_THAT(error, HasSubstr("0 x 16"));
-}
-
-TEST(RenderThreadTest, LimitsLowerTheLargestTexture) {
-    std::unique_ptr<RenderThread> const thread = MustStart({{256}, true, 1, 1});
-    ASSERT_TRUE(thread);
-    EXPECT_EQ(thread->GetContextInfo().maxTextureSize, 256);
-    EXPECT_EQ(RendererFactory::GetRendererDeviceCaps()->GetMaxTextureSize(), 256);
-}
-
-TEST(RenderThreadTest, CallRunsInOrderAndReportsWhatThrows) {
-    LogCapture const log;
-    std::unique_ptr<RenderThread> const thread = MustStart();
+TEST_F(RenderThreadTest, CallRunsInOrderAndReportsWhatThrows) {
+    ThreadPtr const thread = MustStart();
     ASSERT_TRUE(thread);
     struct Counter {
         int value = 0;
@@ -135,18 +132,18 @@ TEST(RenderThreadTest, CallRunsInOrderAndReportsWhatThrows) {
 
     EXPECT_FALSE(thread->Call([] { throw std::runtime_error("spilled ink"); }));
     EXPECT_EQ(log.Count(ANDROID_LOG_ERROR, "spilled ink"), 1);
+    log.Clear();
     EXPECT_TRUE(thread->Call([] {}));
 }
 
 // The renderer collects until it is flushed, so a frame is complete only because running empty flushes.
-TEST(RenderThreadTest, HandsTheFrameBufferBackWhenTheQueueRunsEmpty) {
-    std::unique_ptr<RenderThread> const thread = MustStart({{}, false, 16, 16});
+TEST_F(RenderThreadTest, HandsTheFrameBufferBackWhenTheQueueRunsEmpty) {
+    ThreadPtr const thread = MustStart({{}, true, 16, 16});
     ASSERT_TRUE(thread);
     ITextureObject* texture = nullptr;
     IRenderTarget* offscreen = nullptr;
     thread->Call([&] {
-        texture = RendererFactory::CreateTextureObject(TextureDescriptor(8, 8, 0, 2, 6, 1, false, 0), nullptr,
-                                                       0, {});
+        texture = MakeTexture();
         offscreen = RendererFactory::CreateOffscreenRenderTarget(texture);
     });
     ASSERT_NE(offscreen, nullptr);

@@ -13,9 +13,8 @@ void main() { gl_Position = uMatrix * vec4(aPosition, 0.0, 1.0); }
 
 constexpr char kFragmentShader[] = R"(#version 300 es
 precision highp float;
-uniform vec4 uColor;
 out vec4 oColor;
-void main() { oColor = uColor; }
+void main() { oColor = vec4(0.0, 1.0, 0.0, 1.0); }
 )";
 
 void Compile(GLuint program, GLenum stage, char const* source) {
@@ -47,13 +46,12 @@ ForeignInk::~ForeignInk() {
     EXPECT_EQ(glGetError(), static_cast<GLenum>(GL_NO_ERROR));
 }
 
-void ForeignInk::Fill(RectF const& rect, Matrix4<float> const& matrix, Vector4<float> const& color) const {
+void ForeignInk::Fill(RectF const& rect, Matrix4<float> const& matrix) const {
     EXPECT_EQ(glGetError(), static_cast<GLenum>(GL_NO_ERROR));
     GLfloat const corners[] = {rect.left, rect.top, rect.left,  rect.bottom, rect.right, rect.bottom,
                                rect.left, rect.top, rect.right, rect.bottom, rect.right, rect.top};
     glUseProgram(mProgram);
     glUniformMatrix4fv(glGetUniformLocation(mProgram, "uMatrix"), 1, GL_FALSE, matrix.data());
-    glUniform4f(glGetUniformLocation(mProgram, "uColor"), color.x, color.y, color.z, color.w);
     glBindVertexArray(mVertexArray);
     glBindBuffer(GL_ARRAY_BUFFER, mBuffer);
     glBufferData(GL_ARRAY_BUFFER, sizeof(corners), corners, GL_STREAM_DRAW);

@@ -4,7 +4,6 @@
 
 #include "moka/base/Rect.h"
 #include "moka/graphics/math/Matrix4.h"
-#include "moka/graphics/math/Vector.h"
 
 #include <GLES3/gl3.h>
 
@@ -17,8 +16,9 @@ public:
     ForeignInk(ForeignInk const&) = delete;
     ForeignInk& operator=(ForeignInk const&) = delete;
 
-    // Fills the rectangle, blending off, into what is bound, within the clip, viewport and masks in force.
-    void Fill(RectF const& rect, Matrix4<float> const& matrix, Vector4<float> const& color) const;
+    // Fills the rectangle with green, blending off, into what is bound, within the clip, viewport and masks
+    // in force.
+    void Fill(RectF const& rect, Matrix4<float> const& matrix) const;
 
     // Leaves everything that a draw depends on so that nothing could be drawn with it, or the wrong thing.
     void LeaveAMess() const;

@@ -13,6 +13,7 @@
 #include "tests/pixel/pen/ForeignInk.h"
 #include "tests/support/ImageCompare.h"
 #include "tests/support/LogCapture.h"
+#include "tests/support/NothingLeft.h"
 #include "tests/support/TestImages.h"
 
 #include <functional>
@@ -31,13 +32,17 @@ constexpr int kWidth = 40;
 constexpr int kHeight = 26;
 constexpr Color kPaper{10, 20, 30, 255};
 constexpr Color kInk{0, 255, 0, 255};
-constexpr Vector4<float> kInkColor{0, 1, 0, 1};
 
 TestImage Paper() { return MakeChecker(kWidth, kHeight, kWidth + kHeight, kPaper, kPaper); }
 
 void FillImage(TestImage& image, Rect const& r, Color const& color) {
     for (int y = r.top; y < r.bottom; ++y)
         for (int x = r.left; x < r.right; ++x) image.SetColor(x, y, color);
+}
+
+void FillGradient(TestImage& image, Rect const& r) {
+    for (int y = r.top; y < r.bottom; ++y)
+        for (int x = r.left; x < r.right; ++x) image.SetColor(x, y, GetGradientColor(x - r.left, y - r.top));
 }
 
 // With deferral, and without.
@@ -69,9 +74,7 @@ protected:
             RendererFactory::InvalidateState();
         });
         queue->WaitForTasks();
-        RendererStatistics const s = RendererFactory::GetStatistics();
-        EXPECT_EQ(s.textures + s.frameBuffers + s.programs + s.graphicsObjects + s.stateObjects, 0);
-        EXPECT_EQ(s.errors, 0u);
+        ExpectNothingLeft(RendererFactory::GetStatistics());
         queue.reset();
         for (std::string const& line : log.GetTexts(ANDROID_LOG_ERROR)) ADD_FAILURE() << line;
     }
@@ -94,7 +97,7 @@ protected:
         queue->Call([&] {
             pen->EnableClipRT(0);
             bitmap->GetBitmapWritable()->ActivateFrameBufferRT(false);
-            ink->Fill(rect, pen->GetCanvasMatrix(), kInkColor);
+            ink->Fill(rect, pen->GetCanvasMatrix());
             ink->LeaveAMess();
             pen->DisableClipRT();
             bitmap->GetBitmapWritable()->DeactivateFrameBufferRT(false, DiscardFramebufferNone);
@@ -202,8 +205,7 @@ TEST_P(PenCanvasPixel, OwnDrawsBeforeAndAfterAreRightWhateverIsLeftBehind) {
     FillImage(expected, Rect(1, 0, 2, 1), kInk);
     MKPaint const plain;
     canvas->DrawBitmap(picture.Get(), 30, 10, &plain);
-    for (int y = 0; y < 5; ++y)
-        for (int x = 0; x < 6; ++x) expected.SetColor(30 + x, 10 + y, GetGradientColor(x, y));
+    FillGradient(expected, Rect(30, 10, 36, 15));
     ExpectSame(expected, Read(), "drawn around ink");
 
     DrawInk(RectF(2, 0, 3, 1));
@@ -225,8 +227,7 @@ TEST_P(PenCanvasPixel, OwnDrawsBeforeAndAfterAreRightWhateverIsLeftBehind) {
     FillImage(expected, Rect(4, 0, 5, 1), kInk);
     BitmapPtr const late = Create(MakeGradient(5, 3));
     canvas->DrawBitmap(late.Get(), 33, 20, &plain);
-    for (int y = 0; y < 3; ++y)
-        for (int x = 0; x < 5; ++x) expected.SetColor(33 + x, 20 + y, GetGradientColor(x, y));
+    FillGradient(expected, Rect(33, 20, 38, 23));
     ExpectSame(expected, Read(), "uploaded after ink");
 }
 

@@ -9,7 +9,6 @@
 #include "moka/renderer/IGraphicsObject.h"
 #include "moka/renderer/IParameterBinding.h"
 #include "moka/renderer/IRasterizerState.h"
-#include "moka/renderer/IShaderProgram.h"
 
 #include <array>
 #include <memory>
@@ -17,7 +16,6 @@
 
 namespace Moka::Testing {
 
-using ProgramPtr = std::unique_ptr<IShaderProgram, Releaser>;
 using ParameterPtr = std::unique_ptr<IParameterBinding>;
 using GraphicsPtr = std::unique_ptr<IGraphicsObject, Releaser>;
 using BlendPtr = std::unique_ptr<IBlendStateObject, Releaser>;
@@ -124,9 +122,5 @@ protected:
     BlendPtr blend;
     StatePtr stencil;
 };
-
-inline std::string GetDrawMode(::testing::TestParamInfo<bool> const& mode) {
-    return mode.param ? "Deferred" : "Immediate";
-}
 
 } // namespace Moka::Testing

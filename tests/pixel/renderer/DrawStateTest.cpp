@@ -25,67 +25,6 @@ TEST_P(DrawStateTest, TheScissorHoldsForTheDrawsAndClearsItWasSetFor) {
               With(With(With(Filled(kClear), kRed, 1, 2, 3, 4), kBlue, 6, 6, 2, 2), kGreen, 0, 0, 1, 1));
 }
 
-TEST_P(DrawStateTest, EveryFactorBlends) {
-    struct Row {
-        BlendingFactor source, destination;
-        Pixel expected;
-    };
-    // Source (200, 100, 0, 128) over (100, 200, 50, 64), in bytes.
-    Row const rows[] = {
-        {BlendingFactor::One, BlendingFactor::Zero, {200, 100, 0, 128}},
-        {BlendingFactor::Zero, BlendingFactor::One, {100, 200, 50, 64}},
-        {BlendingFactor::Zero, BlendingFactor::SrcColor, {78, 78, 0, 32}},
-        {BlendingFactor::SrcAlpha, BlendingFactor::Zero, {100, 50, 0, 64}},
-        {BlendingFactor::OneMinusSrcAlpha, BlendingFactor::Zero, {100, 50, 0, 64}},
-        {BlendingFactor::Zero, BlendingFactor::DstAlpha, {25, 50, 13, 16}},
-        {BlendingFactor::Zero, BlendingFactor::OneMinusDstAlpha, {75, 150, 37, 48}},
-        {BlendingFactor::One, BlendingFactor::One, {255, 255, 50, 192}},
-    };
-    target->Activate();
-    int x = 0;
-    for (Row const& row : rows) {
-        BlendStateDescriptor descriptor(true);
-        blend->SetDescriptor(descriptor);
-        blend->Apply();
-        auto const left = static_cast<float>(x++);
-        Fill(Pixel{100, 200, 50, 64}, left, 0, left + 1, 8);
-        descriptor.SetColorEquation(BlendingFunction::Add, row.source, row.destination);
-        // The lower half blends alpha another way.
-        descriptor.SetAlphaEquation(BlendingFunction::Add, row.source, row.destination);
-        blend->SetDescriptor(descriptor);
-        blend->Apply();
-        Fill(Pixel{200, 100, 0, 128}, left, 0, left + 1, 4);
-        descriptor.SetAlphaEquation(BlendingFunction::Add, BlendingFactor::One, BlendingFactor::Zero);
-        blend->SetDescriptor(descriptor);
-        blend->Apply();
-        Fill(Pixel{200, 100, 0, 128}, left, 4, left + 1, 8);
-    }
-    target->Deactivate(false, false);
-    Image const image = Read();
-    for (x = 0; x < 8; ++x) {
-        Pixel const upper = image.At(x, 1);
-        Pixel const expected = rows[x].expected;
-        EXPECT_NEAR(upper.r, expected.r, 1) << x;
-        EXPECT_NEAR(upper.g, expected.g, 1) << x;
-        EXPECT_NEAR(upper.b, expected.b, 1) << x;
-        EXPECT_NEAR(upper.a, expected.a, 1) << x;
-        EXPECT_NEAR(image.At(x, 6).r, expected.r, 1) << x;
-        EXPECT_EQ(image.At(x, 6).a, 128) << x;
-    }
-}
-
-TEST_P(DrawStateTest, BothFlagsOffMaskColourAndClearsDoNotCare) {
-    target->Activate();
-    blend->SetDescriptor(BlendStateDescriptor(false));
-    blend->Apply();
-    Fill(kRed, 0, 0, 8, 8);
-    EXPECT_EQ(Read(), Filled(kClear));
-    target->ClearColor(0, 1, 0, 1);
-    Fill(kRed, 0, 0, 8, 8);
-    target->Deactivate(false, false);
-    EXPECT_EQ(Read(), Filled(kGreen));
-}
-
 TEST_P(DrawStateTest, AStencilClipHoldsForDrawsAndClearsUntilItIsLifted) {
     DepthStencilPtr const buffer = MakeDepthStencil(kSize, kSize);
     target->AttachDepthStencil(buffer.get());
@@ -144,26 +83,6 @@ TEST_P(DrawStateTest, WithoutAnActiveTargetTheHostsFrameBufferIsDrawnInto) {
     RendererFactory::Flush();
     EXPECT_EQ(host.Read().At(1, 1), kRed);
     EXPECT_EQ(Read(), Filled(kBlue));
-}
-
-TEST_P(DrawStateTest, ForeignGlDrawsUnderWhatIsInForceAfterACommit) {
-    RawQuad const foreign("color = vec4(0, 1, 0, 1);");
-    RendererFactory::InvalidateState();
-    IRasterizerState* const rasterizer = RendererFactory::GetRasterizerState();
-    rasterizer->SetScissorRect({0, 0, 4, 8});
-    rasterizer->SetScissorEnabled(true);
-    target->Activate();
-    Fill(kRed, 0, 0, 8, 8);
-    RendererFactory::Commit();
-    target->Activate();
-    foreign.Draw();
-    glViewport(0, 0, 1, 1);
-    glDisable(GL_SCISSOR_TEST);
-    RendererFactory::InvalidateState();
-    rasterizer->SetScissorEnabled(false);
-    Fill(kBlue, 7, 0, 8, 8);
-    target->Deactivate(false, false);
-    EXPECT_EQ(Read(), With(With(Filled(kClear), kGreen, 0, 0, 4, 8), kBlue, 7, 0, 1, 8));
 }
 
 TEST_P(DrawStateTest, TheHostsVertexArrayAndBufferComeBack) {

@@ -2,6 +2,9 @@
 // can stop or widen.
 #include "tests/pixel/renderer/RendererFixture.h"
 
+#include <functional>
+#include <iterator>
+
 namespace Moka::Testing {
 namespace {
 
@@ -20,17 +23,18 @@ TEST_F(RenderTargetTest, TheHostFindsItsFrameBuffersAndViewportAgainAfterAnyNest
     auto const read = static_cast<GLint>(reading.GetName());
     glBindFramebuffer(GL_READ_FRAMEBUFFER, reading.GetName());
     glViewport(3, 5, 7, 11);
-    TexturePtr const texture = MakeTexture(9, 8);
-    TexturePtr const otherTexture = MakeTexture(5, 6);
-    TargetPtr const target = MakeTarget(*texture);
-    TargetPtr const other = MakeTarget(*otherTexture);
+    auto [texture, target] = MakeOffscreen(Image(9, 8));
+    auto const [otherTexture, other] = MakeOffscreen(Image(5, 6));
 
     target->Activate();
     GLint const ours = GetDrawBinding();
     EXPECT_NE(ours, draw);
     EXPECT_EQ(GetReadBinding(), ours);
     EXPECT_EQ(GetViewport(), (Viewport{0, 0, 9, 8}));
-    target->Activate();
+    std::uint64_t const switches = RendererFactory::GetStatistics().frameBufferSwitches;
+    target->Activate(); // active already
+    Read(*target, 9, 8);
+    EXPECT_EQ(RendererFactory::GetStatistics().frameBufferSwitches, switches);
     other->Activate();
     EXPECT_NE(GetDrawBinding(), ours);
     EXPECT_EQ(GetViewport(), (Viewport{0, 0, 5, 6}));
@@ -44,86 +48,39 @@ TEST_F(RenderTargetTest, TheHostFindsItsFrameBuffersAndViewportAgainAfterAnyNest
         EXPECT_EQ(GetReadBinding(), read);
         EXPECT_EQ(GetViewport(), (Viewport{3, 5, 7, 11}));
     }
-}
-
-TEST_F(RenderTargetTest, ActivatingTheActiveTargetCallsNothing) {
-    TexturePtr const texture = MakeTexture(4, 4);
-    TargetPtr const target = MakeTarget(*texture);
     target->Activate();
-    std::uint64_t const switches = RendererFactory::GetStatistics().frameBufferSwitches;
-    for (int i = 0; i < 5; ++i) target->Activate();
-    Clear(*target, kRed);
-    Read(*target, 4, 4);
-    EXPECT_EQ(RendererFactory::GetStatistics().frameBufferSwitches, switches);
+    target.reset();
+    EXPECT_EQ(GetDrawBinding(), draw);
 }
 
 TEST_F(RenderTargetTest, OperationsOnOtherTargetsLeaveTheActiveOneActive) {
-    TexturePtr const texture = MakeTexture(4, 4);
-    TexturePtr const otherTexture = MakeTexture(4, 4);
-    TargetPtr const target = MakeTarget(*texture);
-    TargetPtr const other = MakeTarget(*otherTexture);
+    auto const [texture, target] = MakeOffscreen(Image(4, 4));
+    OffscreenImage const other = MakeOffscreen(Image(4, 4));
     DepthStencilPtr const buffer = MakeDepthStencil(4, 4);
+    TexturePtr fresh;
     target->Activate();
     GLint const ours = GetDrawBinding();
-    auto const expectStillOurs = [&](char const* after) {
-        EXPECT_EQ(GetDrawBinding(), ours) << after;
-        EXPECT_EQ(GetReadBinding(), ours) << after;
+    std::function<void()> const operations[] = {
+        [&] { Clear(*other.target, kRed); },
+        [&] { Read(*other.target, 4, 4); },
+        [&] { other.target->AttachDepthStencil(buffer.get()); },
+        [&] { other.target->ClearDepthStencil(true, 1, true, 0); },
+        [&] { other.target->DetachDepthStencil(); },
+        [&] { fresh = MakeTexture(4, 4); },
+        [&] { MakeTarget(*fresh).reset(); },
+        [&] { fresh->CopyFromRenderTarget(); },
+        [&] { fresh->DrawToCurrent(); },
     };
-    Clear(*other, kRed);
-    expectStillOurs("clear");
-    Read(*other, 4, 4);
-    expectStillOurs("read");
-    other->AttachDepthStencil(buffer.get());
-    expectStillOurs("attach");
-    other->ClearDepthStencil(true, 1, true, 0);
-    expectStillOurs("clear depth and stencil");
-    other->DetachDepthStencil();
-    expectStillOurs("detach");
-    TexturePtr const fresh = MakeTexture(4, 4);
-    expectStillOurs("new texture");
-    MakeTarget(*fresh).reset();
-    expectStillOurs("target made and released");
-    fresh->CopyFromRenderTarget();
-    fresh->DrawToCurrent();
-    expectStillOurs("copies");
-    EXPECT_EQ(Read(*otherTexture), Image(4, 4, kRed));
-}
-
-TEST_F(RenderTargetTest, ReleasingTheActiveTargetGivesTheHostItsFrameBufferBack) {
-    HostFrameBuffer const host(4, 4);
-    TexturePtr const texture = MakeTexture(2, 2);
-    TargetPtr target = MakeTarget(*texture);
-    target->Activate();
-    target.reset();
-    EXPECT_EQ(GetDrawBinding(), static_cast<GLint>(host.GetName()));
-}
-
-TEST_F(RenderTargetTest, ActivationLeavesScissorStencilBlendAndMasksAlone) {
-    glEnable(GL_SCISSOR_TEST);
-    glEnable(GL_STENCIL_TEST);
-    glEnable(GL_BLEND);
-    glColorMask(GL_FALSE, GL_TRUE, GL_TRUE, GL_FALSE);
-    glStencilMask(0x11);
-    TexturePtr const texture = MakeTexture(4, 4);
-    TargetPtr const target = MakeTarget(*texture);
-    auto const expectUnchanged = [] {
-        EXPECT_TRUE(glIsEnabled(GL_SCISSOR_TEST));
-        EXPECT_TRUE(glIsEnabled(GL_STENCIL_TEST));
-        EXPECT_TRUE(glIsEnabled(GL_BLEND));
-        GLboolean mask[4];
-        glGetBooleanv(GL_COLOR_WRITEMASK, mask);
-        EXPECT_TRUE(!mask[0] && mask[1] && mask[2] && !mask[3]);
-        EXPECT_EQ(GetInteger(GL_STENCIL_WRITEMASK), 0x11);
-    };
-    target->Activate();
-    expectUnchanged();
-    target->Deactivate(false, false);
-    expectUnchanged();
+    for (std::size_t i = 0; i < std::size(operations); ++i) {
+        operations[i]();
+        EXPECT_EQ(GetDrawBinding(), ours) << i;
+        EXPECT_EQ(GetReadBinding(), ours) << i;
+    }
+    EXPECT_EQ(Read(*other.texture), Image(4, 4, kRed));
 }
 
 TEST_F(RenderTargetTest, InvertedTrianglesAreDrawnWhateverTheHostCullsAndTheHostGetsItBack) {
-    TexturePtr const texture = MakeTexture(3, 3);
-    TargetPtr const target = MakeTarget(*texture);
+    auto const [texture, target] = MakeOffscreen(Image(3, 3));
     RawQuad const quad("color = vec4(1, 0, 0, 1);");
     glCullFace(GL_FRONT_AND_BACK);
     glDepthFunc(GL_NEVER);
@@ -142,8 +99,7 @@ TEST_F(RenderTargetTest, ATargetMadeAfterADeletionIsBoundAnew) {
     RendererFactory::SetDeferred(true); // so that the shadow is trusted from call to call
     for (Pixel color : {kRed, kGreen, kBlue}) {
         // Deactivated but still bound when its frame buffer goes, whose name the next one may get.
-        TexturePtr const texture = MakeTexture(Image(2, 2));
-        TargetPtr const target = MakeTarget(*texture);
+        auto const [texture, target] = MakeOffscreen(Image(2, 2));
         target->Activate();
         Clear(*target, color);
         target->Deactivate(false, false);
@@ -152,8 +108,7 @@ TEST_F(RenderTargetTest, ATargetMadeAfterADeletionIsBoundAnew) {
 }
 
 TEST_F(RenderTargetTest, ClearColorIgnoresTheColourMaskAndObeysTheScissor) {
-    TexturePtr const texture = MakeTexture(Image(8, 6, kGreen));
-    TargetPtr const target = MakeTarget(*texture);
+    auto const [texture, target] = MakeOffscreen(Image(8, 6, kGreen));
     glClearColor(0.25f, 0.5f, 0.75f, 1);
     glColorMask(GL_FALSE, GL_FALSE, GL_FALSE, GL_FALSE);
     glEnable(GL_SCISSOR_TEST);
@@ -162,9 +117,7 @@ TEST_F(RenderTargetTest, ClearColorIgnoresTheColourMaskAndObeysTheScissor) {
     Clear(*target, kRed);
     EXPECT_EQ(Read(*texture), Image(8, 6, kGreen).With(2, 1, Image(3, 2, kRed), 0, 0, 3, 2));
 
-    GLboolean mask[4];
-    glGetBooleanv(GL_COLOR_WRITEMASK, mask);
-    EXPECT_FALSE(mask[0] || mask[1] || mask[2] || mask[3]);
+    EXPECT_EQ(GetColorMask(), (ColorMask{0, 0, 0, 0}));
     GLfloat color[4];
     glGetFloatv(GL_COLOR_CLEAR_VALUE, color);
     EXPECT_EQ(color[1], 0.5f);
@@ -176,64 +129,42 @@ TEST_F(RenderTargetTest, ClearColorIgnoresTheColourMaskAndObeysTheScissor) {
 }
 
 TEST_F(RenderTargetTest, TheHostsFrameBufferIsCapturedAndNeverDeleted) {
-    HostFrameBuffer const host(6, 4);
-    HostFrameBuffer const later(6, 4);
+    HostFrameBuffer const host(4, 4);
+    HostFrameBuffer const later(4, 4);
     glBindFramebuffer(GL_FRAMEBUFFER, host.GetName());
-    TargetPtr fromDefault(RendererFactory::CreateRenderTargetFromDefault(6, 4));
-    TargetPtr fromCurrent(RendererFactory::CreateRenderTargetFromCurrent(6, 4));
+    auto [texture, target] = MakeOffscreen(Image(4, 4, kClear));
+    TargetPtr fromDefault(RendererFactory::CreateRenderTargetFromDefault(4, 4));
+    TargetPtr fromCurrent(RendererFactory::CreateRenderTargetFromCurrent(4, 4));
+    target->Activate(); // beneath it default is still the host's, and current is the target's
+    TargetPtr const defaultBeneath(RendererFactory::CreateRenderTargetFromDefault(4, 4));
+    TargetPtr const currentBeneath(RendererFactory::CreateRenderTargetFromCurrent(4, 4));
+    target.reset();
     glBindFramebuffer(GL_FRAMEBUFFER, later.GetName());
-    Clear(*fromDefault, kRed);
-    EXPECT_EQ(host.Read(), Image(6, 4, kRed));
-    Clear(*fromCurrent, kBlue);
-    EXPECT_EQ(host.Read(), Image(6, 4, kBlue));
-    EXPECT_EQ(Read(*fromDefault, 6, 4), Image(6, 4, kBlue));
-    EXPECT_EQ(later.Read(), Image(6, 4));
+    IRenderTarget* const hosts[] = {fromDefault.get(), fromCurrent.get(), defaultBeneath.get()};
+    for (int i = 0; i < 3; ++i) {
+        Pixel const color = i == 0 ? kRed : i == 1 ? kBlue : kGreen;
+        Clear(*hosts[i], color);
+        EXPECT_EQ(host.Read(), Image(4, 4, color)) << i;
+    }
+    Clear(*currentBeneath, kRed);
+    EXPECT_EQ(Read(*texture), Image(4, 4, kRed));
+    EXPECT_EQ(Read(*fromDefault, 4, 4), Image(4, 4, kGreen));
+    EXPECT_EQ(later.Read(), Image(4, 4));
     fromDefault.reset();
     fromCurrent.reset();
     EXPECT_TRUE(glIsFramebuffer(host.GetName()));
 }
 
-TEST_F(RenderTargetTest, BeneathAnActiveTargetDefaultIsTheHostsAndCurrentIsTheTargets) {
-    HostFrameBuffer const host(4, 4);
-    TexturePtr texture = MakeTexture(4, 4);
-    TargetPtr target = MakeTarget(*texture);
-    target->Activate();
-    TargetPtr const fromDefault(RendererFactory::CreateRenderTargetFromDefault(4, 4));
-    TargetPtr const fromCurrent(RendererFactory::CreateRenderTargetFromCurrent(4, 4));
-    target.reset();
-    Clear(*fromDefault, kRed);
-    Clear(*fromCurrent, kGreen);
-    EXPECT_EQ(host.Read(), Image(4, 4, kRed));
-    EXPECT_EQ(Read(*texture), Image(4, 4, kGreen));
-}
-
-TEST_F(RenderTargetTest, TheDefaultFrameBufferIsBottomUpAndReadWithoutAFlip) {
-    constexpr int kWidth = kSurfaceWidth;
-    constexpr int kHeight = kSurfaceHeight;
-    TargetPtr const target(RendererFactory::CreateRenderTargetFromDefault(kWidth, kHeight));
-    Clear(*target, kGreen);
-    glEnable(GL_SCISSOR_TEST);
-    glScissor(0, 0, kWidth, 8);
-    Clear(*target, kRed);
-    glDisable(GL_SCISSOR_TEST);
-    Image const expected = Image(kWidth, kHeight, kGreen).With(0, 0, Image(kWidth, 8, kRed), 0, 0, kWidth, 8);
-    EXPECT_EQ(Read(*target, kWidth, kHeight), expected);
-    EXPECT_EQ(GetDrawBinding(), 0);
-}
-
 TEST_F(RenderTargetTest, DiscardingNamesThePartsByTheKindOfTheFrameBuffer) {
     // The fixture fails on any GL error, which the wrong names would be.
-    TexturePtr const texture = MakeTexture(4, 4);
-    TargetPtr const target = MakeTarget(*texture);
+    auto const [texture, target] = MakeOffscreen(Image(4, 4));
     DepthStencilPtr const buffer = MakeDepthStencil(4, 4);
     target->AttachDepthStencil(buffer.get());
     HostFrameBuffer const host(4, 4);
     TargetPtr const hosts(RendererFactory::CreateRenderTargetFromCurrent(4, 4));
     glBindFramebuffer(GL_FRAMEBUFFER, 0);
     TargetPtr const zero(RendererFactory::CreateRenderTargetFromDefault(4, 4));
-    std::vector<IRenderTarget*> targets{target.get(), hosts.get()};
-    targets.push_back(zero.get());
-    for (IRenderTarget* each : targets) {
+    for (IRenderTarget* const each : {target.get(), hosts.get(), zero.get()}) {
         for (int flags = 0; flags < 4; ++flags) {
             each->Activate();
             each->Deactivate(flags & 1, flags & 2);

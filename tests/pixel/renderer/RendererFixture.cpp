@@ -2,6 +2,7 @@
 
 #include "moka/base/log/AndroidLog.h"
 #include "moka/base/log/LogSink.h"
+#include "tests/support/NothingLeft.h"
 
 #include <ostream>
 #include <utility>
@@ -84,8 +85,8 @@ RendererFixture::~RendererFixture() { SetLogSink(nullptr); }
 
 namespace {
 
-// Holds the display open for the life of the process. A driver is unloaded with its last display, and what it had
-// not freed is then reported as leaked without a stack that tells whose it was.
+// Holds the display open for the life of the process. A driver is unloaded with its last display, and what
+// it had not freed is then reported as leaked without a stack that tells whose it was.
 void KeepDriverLoaded(std::string* error) {
     // Stored for real, so that the leak checker finds it.
     [[gnu::used]] static detail::EglContext const* kept = detail::EglContext::Open({}, error).release();
@@ -103,18 +104,10 @@ void RendererFixture::SetUp() {
 
 void RendererFixture::TearDown() {
     if (!mEgl) return;
-    RendererStatistics const left = RendererFactory::GetStatistics();
-    EXPECT_EQ(left.textures, 0);
-    EXPECT_EQ(left.samplers, 0);
-    EXPECT_EQ(left.frameBuffers, 0);
-    EXPECT_EQ(left.renderBuffers, 0);
-    EXPECT_EQ(left.renderTargets, 0);
-    EXPECT_EQ(left.textureObjects, 0);
-    EXPECT_EQ(left.depthStencilBuffers, 0);
-    EXPECT_EQ(left.programs, 0);
-    EXPECT_EQ(left.errors, mKnownDriverErrors);
+    ExpectNothingLeft(RendererFactory::GetStatistics(), 0, mKnownDriverErrors);
     RendererFactory::DetachContext();
-    EXPECT_EQ(RendererFactory::GetStatistics().pooledRenderBuffers, 0);
+    RendererStatistics const after = RendererFactory::GetStatistics();
+    EXPECT_EQ(after.pooledRenderBuffers + after.buffers, 0);
     EXPECT_EQ(glGetError(), GLenum{GL_NO_ERROR});
     EXPECT_EQ(TakeErrors(), std::vector<std::string>{});
 }
@@ -140,6 +133,12 @@ TexturePtr RendererFixture::MakeView(ITextureObject const& model) {
 
 TargetPtr RendererFixture::MakeTarget(ITextureObject& texture) {
     return TargetPtr(RendererFactory::CreateOffscreenRenderTarget(&texture));
+}
+
+OffscreenImage RendererFixture::MakeOffscreen(Image const& image) {
+    TexturePtr texture = MakeTexture(image);
+    TargetPtr target = MakeTarget(*texture);
+    return {std::move(texture), std::move(target)};
 }
 
 DepthStencilPtr RendererFixture::MakeDepthStencil(int width, int height) {
@@ -172,6 +171,18 @@ void RendererFixture::RestartEgl() {
     ASSERT_TRUE(mEgl) << error;
 }
 
+void DrawRawStrip(std::initializer_list<RawAttribute> attributes) {
+    glBindBuffer(GL_ARRAY_BUFFER, 0);
+    GLuint location = 0;
+    for (RawAttribute const& attribute : attributes) {
+        glEnableVertexAttribArray(location);
+        glVertexAttribPointer(location++, attribute.components, GL_FLOAT, GL_FALSE, 0,
+                              attribute.values.data());
+    }
+    glDrawArrays(GL_TRIANGLE_STRIP, 0, 4);
+    while (location > 0) glDisableVertexAttribArray(--location);
+}
+
 RawQuad::RawQuad(char const* fragment) {
     std::string const vertexText =
         "#version 300 es\n"
@@ -197,24 +208,13 @@ RawQuad::RawQuad(char const* fragment) {
     GLint linked = GL_FALSE;
     glGetProgramiv(mProgram, GL_LINK_STATUS, &linked);
     EXPECT_EQ(linked, GL_TRUE) << fragment;
-    // Counter-clockwise, so that the front is seen.
-    GLfloat const corners[] = {0, 0, 1, 0, 0, 1, 1, 1};
-    glGenBuffers(1, &mVertices);
-    glBindBuffer(GL_ARRAY_BUFFER, mVertices);
-    glBufferData(GL_ARRAY_BUFFER, sizeof corners, corners, GL_STATIC_DRAW);
 }
 
-RawQuad::~RawQuad() {
-    glDeleteProgram(mProgram);
-    glDeleteBuffers(1, &mVertices);
-}
+RawQuad::~RawQuad() { glDeleteProgram(mProgram); }
 
 void RawQuad::Draw() const {
     glUseProgram(mProgram);
-    glBindBuffer(GL_ARRAY_BUFFER, mVertices);
-    glEnableVertexAttribArray(0);
-    glVertexAttribPointer(0, 2, GL_FLOAT, GL_FALSE, 0, nullptr);
-    glDrawArrays(GL_TRIANGLE_STRIP, 0, 4);
+    DrawRawStrip({{2, {0, 0, 1, 0, 0, 1, 1, 1}}}); // counter-clockwise, so that the front is seen
 }
 
 GLint GetInteger(GLenum name) {
@@ -227,6 +227,12 @@ std::vector<GLint> GetViewport() {
     std::vector<GLint> viewport(4);
     glGetIntegerv(GL_VIEWPORT, viewport.data());
     return viewport;
+}
+
+ColorMask GetColorMask() {
+    ColorMask mask;
+    glGetBooleanv(GL_COLOR_WRITEMASK, mask.data());
+    return mask;
 }
 
 } // namespace Moka::Testing

@@ -5,12 +5,14 @@
 #include "moka/host/EglContext.h"
 #include "moka/renderer/IDepthStencilBuffer.h"
 #include "moka/renderer/IRenderTarget.h"
+#include "moka/renderer/IShaderProgram.h"
 #include "moka/renderer/ITextureObject.h"
 #include "moka/renderer/RendererFactory.h"
 
 #include <GLES3/gl3.h>
 #include <gtest/gtest.h>
 
+#include <array>
 #include <cstdint>
 #include <iosfwd>
 #include <memory>
@@ -61,7 +63,13 @@ struct Releaser {
 };
 using TexturePtr = std::unique_ptr<ITextureObject>;
 using TargetPtr = std::unique_ptr<IRenderTarget, Releaser>;
+using ProgramPtr = std::unique_ptr<IShaderProgram, Releaser>;
 using DepthStencilPtr = std::unique_ptr<IDepthStencilBuffer, Releaser>;
+
+struct OffscreenImage {
+    TexturePtr texture;
+    TargetPtr target;
+};
 
 // A frame buffer as a host makes it, with raw GL, bound when made.
 class HostFrameBuffer {
@@ -95,6 +103,7 @@ protected:
     static TexturePtr MakeTexture(Image const& image);
     static TexturePtr MakeView(ITextureObject const& model);
     static TargetPtr MakeTarget(ITextureObject& texture);
+    static OffscreenImage MakeOffscreen(Image const& image);
     static DepthStencilPtr MakeDepthStencil(int width, int height);
 
     static Image Read(IRenderTarget& target, int width, int height);
@@ -118,6 +127,15 @@ private:
     std::uint64_t mKnownDriverErrors = 0;
 };
 
+struct RawAttribute {
+    int components;
+    std::vector<GLfloat> values; // of the four vertices, one after the other
+};
+
+// A triangle strip of four vertices with whatever program is current, with raw GL, from the test's own
+// memory; the n-th attribute feeds location n.
+void DrawRawStrip(std::initializer_list<RawAttribute> attributes);
+
 // Draws a quad over the whole viewport with raw GL.
 class RawQuad {
 public:
@@ -132,10 +150,16 @@ public:
 
 private:
     GLuint mProgram = 0;
-    GLuint mVertices = 0;
 };
 
 GLint GetInteger(GLenum name);
 std::vector<GLint> GetViewport();
+using ColorMask = std::array<GLboolean, 4>;
+ColorMask GetColorMask();
+
+// For tests with deferral and without.
+inline std::string GetDrawMode(::testing::TestParamInfo<bool> const& mode) {
+    return mode.param ? "Deferred" : "Immediate";
+}
 
 } // namespace Moka::Testing

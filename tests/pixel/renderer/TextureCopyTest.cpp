@@ -12,6 +12,7 @@ void ObstructDrawing() {
     glBlendFunc(GL_ZERO, GL_ZERO);
     glEnable(GL_STENCIL_TEST);
     glStencilFunc(GL_NEVER, 0, 0xFF);
+    glStencilMask(0x11);
     glColorMask(GL_FALSE, GL_FALSE, GL_FALSE, GL_FALSE);
 }
 
@@ -19,9 +20,8 @@ void ExpectStillObstructed() {
     EXPECT_TRUE(glIsEnabled(GL_SCISSOR_TEST));
     EXPECT_TRUE(glIsEnabled(GL_BLEND));
     EXPECT_TRUE(glIsEnabled(GL_STENCIL_TEST));
-    GLboolean mask[4];
-    glGetBooleanv(GL_COLOR_WRITEMASK, mask);
-    EXPECT_FALSE(mask[0] || mask[1] || mask[2] || mask[3]);
+    EXPECT_EQ(GetColorMask(), (ColorMask{0, 0, 0, 0}));
+    EXPECT_EQ(GetInteger(GL_STENCIL_WRITEMASK), 0x11);
 }
 
 class TextureCopyTest : public RendererFixture, public ::testing::WithParamInterface<bool> {
@@ -31,14 +31,11 @@ protected:
         RendererFactory::SetDeferred(GetParam());
     }
 };
-
-INSTANTIATE_TEST_SUITE_P(ImmediateAndDeferred, TextureCopyTest, ::testing::Bool(),
-                         [](auto const& mode) { return mode.param ? "Deferred" : "Immediate"; });
+INSTANTIATE_TEST_SUITE_P(ImmediateAndDeferred, TextureCopyTest, ::testing::Bool(), GetDrawMode);
 
 TEST_P(TextureCopyTest, ACopyOfTheTargetHasTheSmallerOfBothSizesAndNoFlip) {
     Image const image = Image::Pattern(7, 5);
-    TexturePtr const texture = MakeTexture(image);
-    TargetPtr const target = MakeTarget(*texture);
+    auto const [texture, target] = MakeOffscreen(image);
     for (auto const& [width, height] : {std::pair{7, 5}, {4, 3}, {9, 8}, {4, 8}, {9, 2}}) {
         TexturePtr const copy = MakeTexture(Image(width, height, kGreen));
         target->Activate();
@@ -52,10 +49,9 @@ TEST_P(TextureCopyTest, ACopyOfTheTargetHasTheSmallerOfBothSizesAndNoFlip) {
 
 TEST_P(TextureCopyTest, ACopyOfTheTargetIgnoresTheStateAndKeepsTheBindings) {
     Image const image = Image::Pattern(6, 6);
-    TexturePtr const texture = MakeTexture(image);
+    auto const [texture, target] = MakeOffscreen(image);
     TexturePtr const bound = MakeTexture(2, 2);
     TexturePtr const copy = MakeTexture(6, 6);
-    TargetPtr const target = MakeTarget(*texture);
     ObstructDrawing();
     RendererFactory::InvalidateState();
     target->Activate();
@@ -97,8 +93,7 @@ TEST_P(TextureCopyTest, WithoutAnActiveTargetTheHostsFrameBufferIsTheCurrentOne)
     TexturePtr const texture = MakeTexture(Image::Pattern(4, 3));
     TexturePtr const copy = MakeTexture(4, 3);
     { // What was active last must not be taken for it.
-        TexturePtr const other = MakeTexture(4, 3);
-        TargetPtr const last = MakeTarget(*other);
+        auto const [other, last] = MakeOffscreen(Image(4, 3));
         last->Activate();
         last->Deactivate(false, false);
         texture->DrawToCurrent();
@@ -113,8 +108,7 @@ TEST_P(TextureCopyTest, WithoutAnActiveTargetTheHostsFrameBufferIsTheCurrentOne)
 TEST_P(TextureCopyTest, ATextureDrawsItselfTexelForTexelThroughAnyState) {
     Image const image = Image::Pattern(5, 4);
     TexturePtr const source = MakeTexture(image);
-    TexturePtr const texture = MakeTexture(Image(7, 3, kGreen));
-    TargetPtr const target = MakeTarget(*texture);
+    auto const [texture, target] = MakeOffscreen(Image(7, 3, kGreen));
     DepthStencilPtr const buffer = MakeDepthStencil(7, 3);
     target->AttachDepthStencil(buffer.get());
     ObstructDrawing();
@@ -146,9 +140,8 @@ TEST_P(TextureCopyTest, ATextureDrawsItselfIntoTheLowerLeftOfTheDefaultFrameBuff
 
 TEST_P(TextureCopyTest, ATextureOverTheActiveTargetsStorageCopiesNothing) {
     Image const image = Image::Pattern(5, 4);
-    TexturePtr const texture = MakeTexture(image);
+    auto const [texture, target] = MakeOffscreen(image);
     TexturePtr const view = MakeView(*texture);
-    TargetPtr const target = MakeTarget(*texture);
     target->Activate();
     for (ITextureObject* each : {texture.get(), view.get()}) {
         each->DrawToCurrent();

@@ -129,22 +129,6 @@ TEST(ReferenceClipSet, CutsStraightClipsTowardsZeroAndOthersAtPixelCentres) {
     EXPECT_FALSE(has(ClipSet({a, b, {0, 0, 0, 0, IMKCanvasBase::Intersect, Matrix3f(0.0f)}}, 20), 5, 5));
 }
 
-TEST(ReferenceSampling, BlendsNeighboursAndWraps) {
-    TestImage image(2, 1);
-    image.SetColor(0, 0, {0, 0, 0, 0});
-    image.SetColor(1, 0, {100, 200, 0, 200});
-    auto const red = [&](Wrap wrap, double u) { return Sample(image, {true, wrap, wrap}, u, 0.5).r * 255; };
-    EXPECT_NEAR(red(Wrap::Clamp, 0.5), 50, 1e-9);
-    EXPECT_NEAR(red(Wrap::Clamp, 1.5), 100, 1e-9);
-    EXPECT_NEAR(red(Wrap::Repeat, 1.25), 0, 1e-9);
-    EXPECT_NEAR(red(Wrap::Repeat, 1), 50, 1e-9);
-    EXPECT_NEAR(red(Wrap::Mirror, 1.25), 100, 1e-9);
-    // Outer and inner side of the fringe carry the same coordinates: half a pixel less in scale inside.
-    BitmapQuad const quad{{0, 0, 10, 10}, 0, 0, 1, 1, true};
-    EXPECT_NEAR(quad.GetCoordinates({2, 5}).all[0].x, 1.5 / 9, 1e-9);
-    EXPECT_NEAR(quad.GetCoordinates({0.25, 5}).all[0].x, 0, 1e-9);
-}
-
 TEST(ReferenceCanvas, AllowsOneStepAndMoreOnlyWhereThePictureJumpsAtAPixelsCentre) {
     ReferenceBitmap bitmap(TestImage(20, 20));
     ReferenceCanvas canvas(bitmap, {});
@@ -168,29 +152,6 @@ TEST(ReferenceCanvas, AllowsOneStepAndMoreOnlyWhereThePictureJumpsAtAPixelsCentr
     paint.SetAlpha(0.1f);
     canvas.DrawRect(2, 2, 12, 12, &paint);
     EXPECT_NEAR(slack.Get(3, 5), 0.9 * 255, 3);
-}
-
-TEST(ReferenceCanvas, SkipsStripsThatTheShapeItselfDoesNotMeet) {
-    ReferenceBitmap bitmap(TestImage(20, 20));
-    ReferenceCanvas canvas(bitmap, {10});
-    MKPaint paint;
-    paint.SetLineWidth(8);
-    canvas.DrawLine(5, 9, 15, 9, &paint);
-    EXPECT_EQ(bitmap.image.GetColor(10, 9), (Color{255, 255, 255, 255}));
-    EXPECT_EQ(bitmap.image.GetColor(10, 10), (Color{0, 0, 0, 0}));
-}
-
-TEST(ReferenceCanvas, RestoresWhatWasNotSavedToItsBegin) {
-    ReferenceBitmap bitmap(TestImage(20, 20));
-    ReferenceCanvas canvas(bitmap, {});
-    canvas.PreTranslate(3, 0);
-    canvas.SetClipRect(0, 0, 5, 5, IMKCanvasBase::Intersect);
-    EXPECT_EQ(canvas.Save(IMKCanvasBase::SaveMatrix), 0);
-    canvas.PreTranslate(4, 0);
-    canvas.Restore(-1);
-    EXPECT_EQ(canvas.GetMatrix(), Matrix3f::translateMatrix(3, 0));
-    canvas.Clear(1, 0, 0, 1);
-    EXPECT_EQ(bitmap.image.GetColor(19, 19), (Color{255, 0, 0, 255}));
 }
 
 } // namespace

@@ -47,10 +47,6 @@ Rgba Sample(TestImage const& image, Sampler const& sampler, double u, double v) 
         return FromBytes(
             image.GetColor(WrapIndex(x, image.width, sampler.x), WrapIndex(y, image.height, sampler.y)));
     };
-    if (!sampler.linear) {
-        return texel(static_cast<int>(std::floor(u * image.width)),
-                     static_cast<int>(std::floor(v * image.height)));
-    }
     Place const x = Locate(u, image.width);
     Place const y = Locate(v, image.height);
     return Mix(Mix(texel(x.low, y.low), texel(x.low + 1, y.low), x.between),

@@ -2,7 +2,6 @@
 #pragma once
 
 #include "moka/graphics/canvas/MKPaint.h"
-#include "moka/renderer/TextureParameter.h"
 #include "tests/support/reference/Blend.h"
 #include "tests/support/reference/Coverage.h"
 
@@ -13,12 +12,11 @@ namespace Moka::Testing {
 enum class Wrap { Clamp, Mirror, Repeat };
 
 struct Sampler {
-    bool linear = true;
     Wrap x = Wrap::Clamp;
     Wrap y = Wrap::Clamp;
 };
 
-// u and v are 0 at the image's first column and row, 1 at the end of the last.
+// Linear. u and v are 0 at the image's first column and row, 1 at the end of the last.
 Rgba Sample(TestImage const& image, Sampler const& sampler, double u, double v);
 
 // Whether a linear filter has anything to do there.

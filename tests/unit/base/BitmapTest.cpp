@@ -42,21 +42,22 @@ TEST(BitmapTest, FreesTheBufferWithArrayDeleteOnlyWhileTheSwitchIsOn) {
 TEST(BitmapTest, CopyIsOwnedAndTightAndLeavesTheSourceToTheCaller) {
     // Two rows at stride 12; the buffer ends with the last pixel, not with a whole stride.
     std::unique_ptr<unsigned char[]> const pixels(NewPixels(12 + 8));
-    unsigned char* copy = nullptr;
-    {
+    Testing::DeleteWatch const watch(pixels.get());
+    for (bool const deleteBuffer : {false, true}) {
         Bitmap bitmap;
-        ASSERT_TRUE(bitmap.Construct(pixels.get(), 2, 2, 12, 1, true, false));
-        copy = bitmap.GetBuffer();
+        bool constructed = true;
+        {
+            Testing::FailAllocations const fail;
+            constructed = bitmap.Construct(pixels.get(), 2, 2, 12, 1, true, deleteBuffer);
+        }
+        EXPECT_FALSE(constructed) << "no memory for a copy";
+        ASSERT_TRUE(bitmap.Construct(pixels.get(), 2, 2, 12, 1, true, deleteBuffer));
+        unsigned char const* const copy = bitmap.GetBuffer();
         ASSERT_NE(copy, pixels.get());
         EXPECT_EQ(bitmap.GetStride(), 8);
         EXPECT_TRUE(bitmap.GetDeleteBuffer());
         EXPECT_EQ(std::vector<unsigned char>(copy, copy + 16),
                   (std::vector<unsigned char>{0, 1, 2, 3, 4, 5, 6, 7, 12, 13, 14, 15, 16, 17, 18, 19}));
-    }
-    Testing::DeleteWatch const watch(pixels.get());
-    {
-        Bitmap bitmap;
-        ASSERT_TRUE(bitmap.Construct(pixels.get(), 2, 2, 12, 1, true, true));
     }
     EXPECT_EQ(watch.GetArrayDeletes(), 0);
 }
@@ -64,39 +65,22 @@ TEST(BitmapTest, CopyIsOwnedAndTightAndLeavesTheSourceToTheCaller) {
 TEST(BitmapTest, RefusesBadArgumentsAndStaysUsable) {
     std::unique_ptr<unsigned char[]> const pixels(NewPixels(16));
     struct Case {
-        bool buffer;
         int width, height, stride, format;
     };
     int const max = std::numeric_limits<int>::max();
     Bitmap bitmap;
-    for (Case const& c :
-         {Case{false, 2, 2, 8, 1}, Case{true, 0, 2, 8, 1}, Case{true, 2, 0, 8, 1}, Case{true, -2, 2, 8, 1},
-          Case{true, 2, -2, 8, 1}, Case{true, 2, 2, 7, 1}, Case{true, 2, 2, -8, 1}, Case{true, 2, 2, 8, 0},
-          Case{true, 2, 2, 8, 2}, Case{true, 1 << 30, 1, 0, 1}, Case{true, max, 1, max, 1}}) {
-        EXPECT_FALSE(bitmap.Construct(c.buffer ? pixels.get() : nullptr, c.width, c.height, c.stride,
-                                      c.format, false, true))
+    EXPECT_FALSE(bitmap.Construct(nullptr, 2, 2, 8, 1, false, true));
+    for (Case const& c : {Case{0, 2, 8, 1}, Case{2, 0, 8, 1}, Case{-2, 2, 8, 1}, Case{2, -2, 8, 1},
+                          Case{2, 2, 7, 1}, Case{2, 2, -8, 1}, Case{2, 2, 8, 0}, Case{2, 2, 8, 2},
+                          Case{1 << 30, 1, 0, 1}, Case{max, 1, max, 1}}) {
+        EXPECT_FALSE(bitmap.Construct(pixels.get(), c.width, c.height, c.stride, c.format, false, true))
             << c.width << 'x' << c.height << " stride " << c.stride << " format " << c.format;
         EXPECT_EQ(bitmap.GetBuffer(), nullptr);
     }
     ASSERT_TRUE(bitmap.Construct(pixels.get(), 2, 2, 8, 1, false, false));
-    std::unique_ptr<unsigned char[]> const second(NewPixels(4));
-    EXPECT_FALSE(bitmap.Construct(second.get(), 1, 1, 4, 1, false, true)) << "has pixels already";
-    EXPECT_EQ(bitmap.GetBuffer(), pixels.get());
+    EXPECT_FALSE(bitmap.Construct(pixels.get(), 1, 1, 4, 1, false, true)) << "has pixels already";
     EXPECT_EQ(bitmap.GetWidth(), 2);
     EXPECT_FALSE(bitmap.GetDeleteBuffer());
-}
-
-TEST(BitmapTest, ACopyThatCannotBeAllocatedIsRefused) {
-    std::unique_ptr<unsigned char[]> const pixels(NewPixels(16));
-    Bitmap bitmap;
-    bool constructed = true;
-    {
-        Testing::FailAllocations const fail;
-        constructed = bitmap.Construct(pixels.get(), 2, 2, 8, 1, true, false);
-    }
-    EXPECT_FALSE(constructed);
-    EXPECT_EQ(bitmap.GetBuffer(), nullptr);
-    EXPECT_TRUE(bitmap.Construct(pixels.get(), 2, 2, 8, 1, true, false));
 }
 
 } // namespace

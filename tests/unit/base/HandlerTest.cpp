@@ -59,7 +59,6 @@ protected:
 
 TEST_F(HandlerTest, MessagesOfAllHandlersRunInTheOrderTheyWereSent) {
     MessageLoop loop;
-    EXPECT_EQ(MessageLoop::GetCurrent(), &loop);
     std::vector<std::pair<char, int>> order;
     Receiver const a([&](Handler*, int what) { order.emplace_back('a', what); });
     Receiver const b([&](Handler*, int what) { order.emplace_back('b', what); });
@@ -87,20 +86,14 @@ TEST_F(HandlerTest, HasMessageMeansWaitingToRun) {
     EXPECT_FALSE(coalesced->HasMessage());
 }
 
-TEST_F(HandlerTest, WithoutALoopEveryMessageIsRefused) {
-    ASSERT_EQ(MessageLoop::GetCurrent(), nullptr);
+TEST_F(HandlerTest, WithoutItsLoopAHandlerRefusesEveryMessage) {
     Receiver const orphan;
     EXPECT_EQ(mLines.size(), 1U);
-    MessageLoop loop; // too late
-    EXPECT_FALSE(orphan->SendMessage());
-    EXPECT_FALSE(orphan->HasMessage());
-    EXPECT_EQ(loop.RunPending(), 0);
-}
-
-TEST_F(HandlerTest, TheLoopMayGoFirst) {
     auto loop = std::make_unique<MessageLoop>();
-    Receiver receiver;
+    Receiver const receiver;
     EXPECT_TRUE(receiver->SendMessage());
+    EXPECT_FALSE(orphan->SendMessage()) << "the loop came too late";
+    EXPECT_FALSE(orphan->HasMessage());
     loop.reset();
     EXPECT_EQ(MessageLoop::GetCurrent(), nullptr);
     EXPECT_FALSE(receiver->HasMessage());
@@ -110,22 +103,9 @@ TEST_F(HandlerTest, TheLoopMayGoFirst) {
     EXPECT_THAT(receiver.GetReceived(), IsEmpty());
 }
 
-TEST_F(HandlerTest, DestructionWithdrawsItsOwnPendingMessages) {
+TEST_F(HandlerTest, AMessageMayDestroyItsOwnHandlerAndOthersWithTheirPendingMessages) {
     MessageLoop loop;
     Receiver const kept;
-    Receiver gone;
-    for (int i = 0; i < 3; ++i) {
-        gone->SendMessage(i);
-        kept->SendMessage(i);
-    }
-    gone.DestroyHandler();
-    EXPECT_EQ(loop.RunPending(), 3);
-    EXPECT_THAT(kept.GetReceived(), ElementsAre(0, 1, 2));
-    EXPECT_THAT(gone.GetReceived(), IsEmpty());
-}
-
-TEST_F(HandlerTest, AMessageMayDestroyItsOwnHandlerAndOthers) {
-    MessageLoop loop;
     Receiver other;
     Receiver* self = nullptr;
     Receiver receiver([&](Handler*, int) {
@@ -133,12 +113,13 @@ TEST_F(HandlerTest, AMessageMayDestroyItsOwnHandlerAndOthers) {
         other.DestroyHandler();
     });
     self = &receiver;
-    receiver->SendMessage(1);
-    receiver->SendMessage(2);
-    other->SendMessage(3);
-    EXPECT_EQ(loop.RunPending(), 1);
-    EXPECT_THAT(receiver.GetReceived(), ElementsAre(1));
+    for (int i = 0; i < 3; ++i)
+        for (Receiver const* each : std::vector<Receiver const*>{&receiver, &other, &kept})
+            (*each)->SendMessage(i);
+    EXPECT_EQ(loop.RunPending(), 4);
+    EXPECT_THAT(receiver.GetReceived(), ElementsAre(0));
     EXPECT_THAT(other.GetReceived(), IsEmpty());
+    EXPECT_THAT(kept.GetReceived(), ElementsAre(0, 1, 2));
 }
 
 TEST_F(HandlerTest, RunPendingLeavesWhatIsSentMeanwhile) {
@@ -236,7 +217,6 @@ public:
         mLoop.load()->Quit();
         mThread.join();
     }
-    std::thread::id GetId() const { return mThread.get_id(); }
 
 private:
     std::atomic<MessageLoop*> mLoop{nullptr};
@@ -249,14 +229,12 @@ TEST_F(HandlerTest, EveryThreadsMessagesArriveOnceAndInOrderOnTheLoopsThread) {
     std::unique_ptr<Receiver> receiver;
     std::atomic<int> arrived{0};
     std::atomic<bool> elsewhere{false};
-    LoopThread* loop = nullptr;
-    LoopThread running([&] {
+    LoopThread loop([&] {
         receiver = std::make_unique<Receiver>([&](Handler*, int) {
-            elsewhere = elsewhere || std::this_thread::get_id() != loop->GetId();
+            elsewhere = elsewhere || !MessageLoop::GetCurrent();
             ++arrived;
         });
     });
-    loop = &running;
     std::vector<std::thread> senders;
     for (int s = 0; s < kSenders; ++s) {
         senders.emplace_back([&, s] {
@@ -268,7 +246,7 @@ TEST_F(HandlerTest, EveryThreadsMessagesArriveOnceAndInOrderOnTheLoopsThread) {
     }
     for (std::thread& sender : senders) sender.join();
     while (arrived < kSenders * kMessages) std::this_thread::yield();
-    running.Stop();
+    loop.Stop();
     EXPECT_FALSE(elsewhere);
     int next[kSenders] = {};
     for (int const what : receiver->GetReceived()) ASSERT_EQ(what % kMessages, next[what / kMessages]++);
@@ -302,44 +280,27 @@ TEST_F(HandlerTest, DestructionElsewhereWaitsForTheRunningMessage) {
 }
 
 TEST_F(HandlerTest, HandlersMayComeAndGoWhileTheLoopIsBusy) {
-    constexpr int kRounds = 300;
-    for (int round = 0; round < kRounds; ++round) {
-        auto count = std::make_unique<std::atomic<int>>(0);
-        std::unique_ptr<Handler> handler;
-        LoopThread loop([&] {
-            handler = std::make_unique<Handler>(
-                [](Handler*, void* argument, int) { ++*static_cast<std::atomic<int>*>(argument); },
-                count.get());
-        });
-        for (int i = 0; i < 20; ++i) handler->SendMessage(i);
+    for (int round = 0; round < 300; ++round) {
+        std::unique_ptr<Receiver> receiver;
+        LoopThread loop([&] { receiver = std::make_unique<Receiver>(); });
+        for (int i = 0; i < 20; ++i) (*receiver)->SendMessage(i);
         if (round % 3 == 0) loop.Stop(); // the loop goes first
-        handler.reset();
-        count.reset(); // a message that still ran would touch it
+        receiver.reset();                // a message that still ran would touch it
     }
 }
-
-struct OneShot {
-    std::unique_ptr<Handler> handler;
-    std::atomic<bool>* done = nullptr;
-};
 
 // The message can destroy the handler while the sender is still inside SendMessage.
 TEST_F(HandlerTest, AHandlerMayBeDestroyedByTheMessageBeingSent) {
     for (int round = 0; round < 300; ++round) {
         std::atomic<bool> done{false};
-        auto* shot = new OneShot;
-        shot->done = &done;
+        std::unique_ptr<Receiver> receiver;
         LoopThread const loop([&] {
-            shot->handler = std::make_unique<Handler>(
-                [](Handler*, void* argument, int) {
-                    std::unique_ptr<OneShot> const own(static_cast<OneShot*>(argument));
-                    own->handler.reset();
-                    *own->done = true;
-                },
-                shot);
+            receiver = std::make_unique<Receiver>([&](Handler*, int) {
+                receiver->DestroyHandler();
+                done = true;
+            });
         });
-        Handler* const handler = shot->handler.get();
-        EXPECT_TRUE(handler->SendMessage());
+        EXPECT_TRUE((*receiver)->SendMessage());
         while (!done) std::this_thread::yield();
     }
 }

@@ -17,6 +17,8 @@
 namespace Moka {
 namespace {
 
+int GetPriority() { return getpriority(PRIO_PROCESS, static_cast<id_t>(gettid())); }
+
 struct Seen {
     std::string name;
     int priority = 0;
@@ -28,9 +30,22 @@ void Look(void* argument) {
     char name[64] = {};
     pthread_getname_np(pthread_self(), name, sizeof name);
     seen->name = name;
-    seen->priority = getpriority(PRIO_PROCESS, static_cast<id_t>(gettid()));
+    seen->priority = GetPriority();
     std::this_thread::sleep_for(std::chrono::milliseconds(5));
     seen->done = true;
+}
+
+// What a thread of this name and priority sees, waited for by its destructor.
+Seen LookAround(char const* name, int priority = GetPriority()) {
+    Seen seen;
+    std::string given(name ? name : "");
+    {
+        Thread thread(Look, &seen, name ? given.c_str() : nullptr, priority);
+        given.assign(given.size(), '#'); // the name was copied
+        EXPECT_TRUE(thread.Start());
+    }
+    EXPECT_TRUE(seen.done);
+    return seen;
 }
 
 class ThreadTest : public testing::Test {
@@ -44,53 +59,29 @@ protected:
 };
 
 TEST_F(ThreadTest, NamesAreCutAtACharacter) {
-    struct Case {
-        char const* given;
-        char const* got;
+    std::pair<char const*, char const*> const cases[] = {
+        {"worker", "worker"},
+        {"fifteen bytes !", "fifteen bytes !"},
+        {"MokaBitmapLoader thread", "MokaBitmapLoade"},
+        {"12345678901234\xc3\xa4", "12345678901234"},
+        {"1234567890123\xc3\xa4", "1234567890123\xc3\xa4"},
+        {"123456789012\xf0\x9f\x98\x80", "123456789012"},
+        {"12345678901\xf0\x9f\x98\x80z", "12345678901\xf0\x9f\x98\x80"},
     };
-    for (Case const& c : {
-             Case{"worker", "worker"},
-             Case{"fifteen bytes !", "fifteen bytes !"},
-             Case{"MokaBitmapLoader thread", "MokaBitmapLoade"},
-             Case{"12345678901234\xc3\xa4", "12345678901234"},
-             Case{"1234567890123\xc3\xa4", "1234567890123\xc3\xa4"},
-             Case{"123456789012\xf0\x9f\x98\x80", "123456789012"},
-             Case{"12345678901\xf0\x9f\x98\x80z", "12345678901\xf0\x9f\x98\x80"},
-         }) {
-        Seen seen;
-        std::string given(c.given);
-        Thread thread(Look, &seen, given.c_str());
-        given.assign(given.size(), '#'); // the name was copied
-        ASSERT_TRUE(thread.Start());
-        thread.Join();
-        EXPECT_EQ(seen.name, c.got);
-    }
-    Seen seen;
-    Thread unnamed(Look, &seen, nullptr);
-    ASSERT_TRUE(unnamed.Start());
-    unnamed.Join();
-    EXPECT_TRUE(seen.done);
+    for (auto const& [given, got] : cases) EXPECT_EQ(LookAround(given).name, got);
+    LookAround(nullptr);
 }
 
 TEST_F(ThreadTest, PriorityIsItsOwnAndARefusedOneIsIgnored) {
-    int const own = getpriority(PRIO_PROCESS, static_cast<id_t>(gettid()));
-    Seen lower;
-    Thread low(Look, &lower, "low", own + 3);
-    ASSERT_TRUE(low.Start());
-    low.Join();
-    EXPECT_EQ(lower.priority, own + 3);
-    EXPECT_EQ(getpriority(PRIO_PROCESS, static_cast<id_t>(gettid())), own);
-    for (int const refusable : {-20, -1000, 1000}) {
-        Seen seen;
-        Thread thread(Look, &seen, "p", refusable);
-        ASSERT_TRUE(thread.Start());
-        thread.Join();
-        EXPECT_TRUE(seen.done);
-    }
+    int const own = GetPriority();
+    EXPECT_EQ(LookAround("low", own + 3).priority, own + 3);
+    EXPECT_EQ(GetPriority(), own);
+    for (int const refusable : {-20, -1000, 1000}) LookAround("p", refusable);
     EXPECT_TRUE(mLines.empty());
 }
 
 TEST_F(ThreadTest, StartsOnceAndJoinsHarmlessly) {
+    { Thread const never(Look, nullptr, "never started"); }
     Seen seen;
     Thread thread(Look, &seen, "once");
     thread.Join();
@@ -105,38 +96,26 @@ TEST_F(ThreadTest, StartsOnceAndJoinsHarmlessly) {
     EXPECT_NE(mLines[0].find("once"), std::string::npos);
 }
 
-TEST_F(ThreadTest, DestructionWaitsForTheFunction) {
-    Seen seen;
-    {
-        Thread thread(Look, &seen, "waited for");
-        ASSERT_TRUE(thread.Start());
-    }
-    EXPECT_TRUE(seen.done);
-    { Thread const never(Look, &seen, "never started"); }
-}
-
 struct SelfDeleting {
     Thread* thread = nullptr;
-    std::atomic<bool>* done = nullptr;
+    std::atomic<bool> done{false};
 };
 
 void DeleteOwnThread(void* argument) {
-    SelfDeleting const own = *static_cast<SelfDeleting*>(argument);
+    auto& own = *static_cast<SelfDeleting*>(argument);
     own.thread->Join(); // an error line, not a deadlock
     delete own.thread;
-    *own.done = true;
+    own.done = true;
 }
 
 // Often enough that the function at times runs before Start has returned.
 TEST_F(ThreadTest, AFunctionMayDeleteItsOwnThread) {
     constexpr int kRounds = 300;
     for (int i = 0; i < kRounds; ++i) {
-        std::atomic<bool> done{false};
         SelfDeleting own;
-        own.done = &done;
         own.thread = new Thread(DeleteOwnThread, &own, "self");
         ASSERT_TRUE(own.thread->Start());
-        while (!done) std::this_thread::yield();
+        while (!own.done) std::this_thread::yield();
     }
     SetLogSink(nullptr);
     EXPECT_EQ(mLines.size(), static_cast<std::size_t>(kRounds));

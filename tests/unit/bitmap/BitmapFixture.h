@@ -13,16 +13,15 @@
 #include "tests/support/RecordingRenderer.h"
 #include "tests/support/TestImages.h"
 
-#include <cmath>
 #include <cstring>
 #include <gtest/gtest.h>
-#include <memory>
 #include <string>
 #include <vector>
 
 namespace Moka::Testing {
 
 using Pixels = std::vector<unsigned char>;
+using BitmapPtr = RefPtr<IMKBitmap>;
 
 inline Pixels UniquePixels(int width, int height) { return MakeGradient(width, height).pixels; }
 
@@ -35,6 +34,25 @@ inline unsigned int PixelAt(Pixels const& pixels, int width, int x, int y) {
 inline int CountOf(IMKBitmap* bitmap) { return dynamic_cast<RefCount*>(bitmap)->GetRefCount(); }
 inline int CountOf(IMKSubBitmap* strip) { return dynamic_cast<RefCount*>(strip)->GetRefCount(); }
 
+// What the callbacks of asynchronous reads were given.
+struct Seen {
+    int calls = 0;
+    unsigned int pixel = 1;
+    Rect rect;
+    void* destination = nullptr;
+    static void OnPixel(unsigned int pixel, void* seen) {
+        auto* const self = static_cast<Seen*>(seen);
+        ++self->calls;
+        self->pixel = pixel;
+    }
+    static void OnData(Rect const& r, void* destination, void* seen) {
+        auto* const self = static_cast<Seen*>(seen);
+        ++self->calls;
+        self->rect = r;
+        self->destination = destination;
+    }
+};
+
 class BitmapFixture : public ::testing::Test {
 protected:
     static constexpr int kMaxSide = 64;
@@ -44,27 +62,42 @@ protected:
         RecordingRenderer::SetMaxTextureSize(kMaxSide);
         ASSERT_TRUE(RendererFactory::AttachContext());
         RecordingRenderer::DeclareNoRenderThread();
-        for (HandPumpedQueue* q :
-             {static_cast<HandPumpedQueue*>(&queue), static_cast<HandPumpedQueue*>(&picky)})
-            q->SetAroundRun([] { RecordingRenderer::DeclareRenderThread(); },
-                            [] { RecordingRenderer::DeclareNoRenderThread(); });
+        RunOnRenderThread(queue);
+        RunOnRenderThread(picky);
     }
 
     void TearDown() override {
         queue.RunAll();
         picky.RunAll();
         EXPECT_EQ(RecordingRenderer::CountLiveObjects(), 0);
-        ExpectNoViolations();
+        for (std::string const& violation : RecordingRenderer::GetViolations()) ADD_FAILURE() << violation;
         RecordingRenderer::DeclareRenderThread();
         RendererFactory::DetachContext();
     }
 
-    static void ExpectNoViolations() {
-        for (std::string const& violation : RecordingRenderer::GetViolations()) ADD_FAILURE() << violation;
+    static void RunOnRenderThread(HandPumpedQueue& any) {
+        any.SetAroundRun([] { RecordingRenderer::DeclareRenderThread(); },
+                         [] { RecordingRenderer::DeclareNoRenderThread(); });
     }
 
     IMKBitmap* Create(int width, int height, void const* pixels = nullptr) {
         return MKGraphicsFactory::CreateBitmap(&queue, width, height, pixels, false, 1, false);
+    }
+    BitmapPtr NewBitmap(int width, int height, void const* pixels = nullptr) {
+        return BitmapPtr::Adopt(Create(width, height, pixels));
+    }
+    BitmapPtr NewPickyBitmap(int width, int height) {
+        return BitmapPtr::Adopt(
+            MKGraphicsFactory::CreateBitmap(&picky, width, height, nullptr, false, 1, false));
+    }
+    static Pixels ReadAll(BitmapPtr const& bitmap) {
+        Rect const r = bitmap->GetBitmapRect();
+        Pixels pixels(static_cast<std::size_t>(r.GetWidth() * r.GetHeight() * 4));
+        bitmap->GetBitmapData(r, pixels.data());
+        return pixels;
+    }
+    static IMKSubBitmap* StripOf(BitmapPtr const& bitmap, int i = 0) {
+        return bitmap->GetTextureBitmap()->GetSubBitmap(i);
     }
 
     // On the render thread, which the test's thread then is until the end of the scope.

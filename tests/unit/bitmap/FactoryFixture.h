@@ -13,8 +13,6 @@
 
 namespace Moka::Testing {
 
-using BitmapPtr = RefPtr<IMKBitmap>;
-
 class Factory : public BitmapFixture {
 protected:
     void SetUp() override {
@@ -37,13 +35,6 @@ protected:
         String const path = Path(name);
         EXPECT_TRUE(BitmapFactory::SaveBitmap(&bitmap, &path, 100));
         return path;
-    }
-
-    static void ExpectImage(BitmapPtr const& bitmap, Pixels const& expected) {
-        ASSERT_TRUE(bitmap);
-        Pixels pixels(expected.size());
-        bitmap->GetBitmapData(bitmap->GetBitmapRect(), pixels.data());
-        EXPECT_EQ(pixels, expected);
     }
 
     std::filesystem::path folder;

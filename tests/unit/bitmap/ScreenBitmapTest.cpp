@@ -7,6 +7,8 @@
 
 #include <gmock/gmock.h>
 
+#include <algorithm>
+#include <cmath>
 #include <limits>
 
 namespace Moka::Testing {
@@ -18,15 +20,12 @@ using ::testing::ElementsAre;
 
 class ScreenBitmap : public BitmapFixture {
 protected:
-    using BitmapPtr = RefPtr<IMKBitmap>;
-
-    BitmapPtr NewScreen(int x, int y, int width, int height, int useDefault = 1) {
+    BitmapPtr NewScreen(int x, int y, int width, int height, int useDefault = 1, int useQueue = 1) {
         return BitmapPtr::Adopt(
-            MKGraphicsFactory::CreateScreenBitmap(&queue, x, y, width, height, useDefault, 1));
+            MKGraphicsFactory::CreateScreenBitmap(&queue, x, y, width, height, useDefault, useQueue));
     }
     BitmapPtr NewScreenRT(int x, int y, int width, int height, int useDefault = 1) {
-        return BitmapPtr::Adopt(
-            MKGraphicsFactory::CreateScreenBitmap(&queue, x, y, width, height, useDefault, 0));
+        return NewScreen(x, y, width, height, useDefault, 0);
     }
     // Clears the frame buffer to black but for one red pixel.
     static void PaintHost(int x, int y) {
@@ -45,16 +44,6 @@ protected:
 
     LogCapture log;
 };
-
-void Store(unsigned pixel, void* userData) { *static_cast<unsigned*>(userData) = pixel; }
-void Count(Rect const&, void*, void* userData) { ++*static_cast<int*>(userData); }
-
-TEST_F(ScreenBitmap, AnEdgeBeyondTheRangeOfIntIsCutToIt) {
-    constexpr int kMost = std::numeric_limits<int>::max();
-    constexpr int kLeast = std::numeric_limits<int>::min();
-    auto const screen = NewScreen(kMost - 1, kLeast, 20, -2);
-    EXPECT_EQ(screen->GetBitmapRect(), Rect(kMost - 1, kLeast, kMost, kLeast));
-}
 
 TEST_F(ScreenBitmap, StandsForTheFrameBufferAskedForAndClonesForTheOther) {
     auto const usual = NewScreen(3, 4, 20, 10);
@@ -77,91 +66,81 @@ TEST_F(ScreenBitmap, StandsForTheFrameBufferAskedForAndClonesForTheOther) {
     EXPECT_EQ(usual->GetBitmapReadable(), nullptr);
     EXPECT_EQ(usual->GetTextureBitmap(), nullptr);
     EXPECT_EQ(MKGraphicsFactory::CreateScreenBitmap(nullptr, 0, 0, 1, 1, 1, 1), nullptr);
+    constexpr int kMost = std::numeric_limits<int>::max(); // what lies beyond is cut to it
+    constexpr int kLeast = std::numeric_limits<int>::min();
+    EXPECT_EQ(NewScreen(kMost - 1, kLeast, 20, -2)->GetBitmapRect(), Rect(kMost - 1, kLeast, kMost, kLeast));
 }
 
 TEST_F(ScreenBitmap, TheProjectionTurnsRowsOverAndIgnoresThePlace) {
-    auto const screen = NewScreen(3, 4, 20, 10);
-    Matrix4<float> m = screen->GetBitmapWritable()->GetProjectionMatrix();
-    Matrix4<float> expected(0.0f);
-    expected[0] = 0.1f;
-    expected[5] = -0.2f;
-    std::uint32_t const depthBits = 0xB8000100u;
-    std::memcpy(&expected[10], &depthBits, 4);
-    expected[12] = -1;
-    expected[13] = 1;
-    expected[14] = -0.0f;
-    expected[15] = 1;
-    EXPECT_EQ(m, expected);
-    m = NewScreen(0, 0, 0, 0)->GetBitmapWritable()->GetProjectionMatrix();
-    EXPECT_TRUE(std::isnan(m[12]));
+    auto const projection = [&](int width, int height) {
+        return NewScreen(3, 4, width, height)->GetBitmapWritable()->GetProjectionMatrix();
+    };
+    EXPECT_EQ(projection(20, 10),
+              Matrix4<float>(0.1f, 0, 0, 0, 0, -0.2f, 0, 0, 0, 0, -1.0f / 32767, 0, -1, 1, -0.0f, 1));
+    EXPECT_TRUE(std::isnan(projection(0, 0)[12]));
 }
 
 TEST_F(ScreenBitmap, APixelIsReadOneRowOffAndNeverReturnedOnTheCallersSide) {
     auto const screen = NewScreen(0, 0, 20, 10);
-    auto const at = [&](int x, int y) {
-        unsigned pixel = 1;
-        screen->GetPixelAsync(Point(x, y), &pixel, Store);
-        queue.RunAll();
-        return pixel;
+    struct {
+        Point asked;
+        unsigned read;
+    } const cases[] = {
+        {Point(19, 9), kRed},   {Point(20, 10), kRed},                    // inclusive: the same one
+        {Point(19, 8), kBlack}, {Point(18, 9), kBlack}, {Point(7, 0), 0}, // row 10 is outside
+        {Point(21, 5), 0},      {Point(-1, 5), 0},      {Point(5, 11), 0}, {Point(5, -1), 0},
     };
-    PaintHost(7, 6);
-    EXPECT_EQ(at(7, 4), kRed) << "row 10 - 4";
-    EXPECT_EQ(at(7, 3), kBlack);
-    EXPECT_EQ(at(7, 0), 0u) << "row 10 is outside";
-    EXPECT_EQ(screen->GetPixel(Point(7, 4)), 0u);
-    EXPECT_EQ(queue.GetWaitCount(), 1);
     PaintHost(19, 1);
-    EXPECT_EQ(at(19, 9), kRed);
-    EXPECT_EQ(at(20, 10), kRed) << "inclusive: the same one";
-    for (Point const& p : {Point(21, 5), Point(-1, 5), Point(5, 11), Point(5, -1)})
-        EXPECT_EQ(at(p.x, p.y), 0u);
+    for (auto const& [asked, read] : cases) {
+        Seen seen;
+        screen->GetPixelAsync(asked, &seen, Seen::OnPixel);
+        queue.RunAll();
+        EXPECT_EQ(seen.pixel, read) << asked.x << ", " << asked.y;
+    }
+    EXPECT_EQ(screen->GetPixel(Point(19, 9)), 0u);
+    EXPECT_EQ(queue.GetWaitCount(), 1);
     EXPECT_EQ(CountOf(screen.Get()), 1);
     screen->GetPixelAsync(Point(1, 1), nullptr, nullptr);
 
     OnRenderThread const here;
     auto const direct = NewScreenRT(0, 0, 20, 10);
     EXPECT_EQ(direct->GetPixel(Point(19, 9)), kRed);
-    unsigned pixel = 1;
-    direct->GetPixelAsync(Point(19, 9), &pixel, Store);
-    EXPECT_EQ(pixel, kRed);
+    Seen seen;
+    direct->GetPixelAsync(Point(19, 9), &seen, Seen::OnPixel);
+    EXPECT_EQ(seen.pixel, kRed);
     EXPECT_EQ(CountOf(direct.Get()), 1);
 }
 
 TEST_F(ScreenBitmap, ABlockIsReadUnturnedIntoItsPlaceInTheDestination) {
     auto const screen = NewScreen(2, 1, 18, 9);
     PaintHost(5, 3);
-    std::vector<unsigned> pixels(20 * 12, 1);
-    int calls = 0;
-    auto const check = [&] {
-        for (int y = 0; y < 12; ++y) {
-            for (int x = 0; x < 20; ++x) {
-                // From (2, 1), which lies at (3, 3), to the end of a target that is 18 wide and 9 high.
-                bool const inside = x >= 3 && x < 19 && y >= 3 && y < 11;
-                unsigned const expected = !inside ? 1 : x == 6 && y == 5 ? kRed : kBlack;
-                ASSERT_EQ(pixels[static_cast<std::size_t>(y * 20 + x)], expected) << x << ' ' << y;
-            }
-        }
-        pixels.assign(pixels.size(), 1);
-    };
     Rect const asked(-1, -2, 19, 10);
-    screen->GetBitmapData(asked, pixels.data());
+    // From (2, 1), which lies at (3, 3), to the end of a target that is 18 wide and 9 high.
+    std::vector<unsigned> expected(20 * 12, 1);
+    for (std::size_t y = 3; y < 11; ++y) std::fill_n(&expected[y * 20 + 3], 16, kBlack);
+    expected[5 * 20 + 6] = kRed;
+    std::vector<unsigned> pixels;
+    Seen seen;
+    auto const read = [&](auto const& action) {
+        pixels.assign(20 * 12, 1);
+        action();
+        return pixels;
+    };
+    EXPECT_EQ(read([&] { screen->GetBitmapData(asked, pixels.data()); }), expected);
     EXPECT_EQ(queue.GetWaitCount(), 1);
-    check();
-    screen->GetBitmapDataAsync(asked, pixels.data(), &calls, Count);
-    queue.RunAll();
-    check();
-    screen->GetBitmapDataAsync(Rect(30, 30, 40, 40), pixels.data(), &calls, Count);
-    queue.RunAll();
-    EXPECT_EQ(calls, 2) << "also for nothing";
-    EXPECT_THAT(pixels, Each(1u));
+    auto const readAsync = [&](IMKBitmap& bitmap, Rect const& r) {
+        bitmap.GetBitmapDataAsync(r, pixels.data(), &seen, Seen::OnData);
+        queue.RunAll();
+    };
+    EXPECT_EQ(read([&] { readAsync(*screen, asked); }), expected);
+    EXPECT_THAT(read([&] { readAsync(*screen, Rect(30, 30, 40, 40)); }), Each(1u));
+    EXPECT_EQ(seen.calls, 2) << "also for nothing";
     EXPECT_EQ(CountOf(screen.Get()), 1);
     OnRenderThread const here;
     auto const direct = NewScreenRT(2, 1, 18, 9);
-    direct->GetBitmapDataAsync(asked, pixels.data(), &calls, Count);
-    EXPECT_EQ(calls, 3);
-    check();
-    direct->GetBitmapData(asked, pixels.data());
-    check();
+    EXPECT_EQ(read([&] { direct->GetBitmapDataAsync(asked, pixels.data(), &seen, Seen::OnData); }), expected);
+    EXPECT_EQ(seen.calls, 3);
+    EXPECT_EQ(read([&] { direct->GetBitmapData(asked, pixels.data()); }), expected);
 }
 
 TEST_F(ScreenBitmap, ActivationIsPostedDeactivationIsNotAndAttachingOnlyCounts) {
@@ -201,15 +180,6 @@ TEST_F(ScreenBitmap, ActivationIsPostedDeactivationIsNotAndAttachingOnlyCounts) 
 
 TEST_F(ScreenBitmap, AnUnknownTypeGivesOneErrorLineAndAnInertBitmap) {
     auto const type = static_cast<MKBitmap::FramebufferType>(5);
-    auto const use = [&](IMKBitmap& screen) {
-        unsigned pixel = 1;
-        screen.GetPixelAsync(Point(1, 1), &pixel, Store);
-        screen.GetBitmapWritable()->ActivateFrameBufferRT(false);
-        screen.GetBitmapWritable()->ClearColorRT(0, 0, 0, 0);
-        screen.GetBitmapWritable()->DeactivateFrameBufferRT(false, DiscardFramebufferNone);
-        queue.RunAll();
-        EXPECT_EQ(pixel, 0u);
-    };
     auto const posted = BitmapPtr::Adopt(new MKScreenBitmap(&queue, 0, 0, 4, 4, type));
     queue.RunAll();
     RecordingRenderer::DeclareRenderThread();
@@ -218,8 +188,12 @@ TEST_F(ScreenBitmap, AnUnknownTypeGivesOneErrorLineAndAnInertBitmap) {
                                                              "MKScreenBitmapRT Invalid framebuffer type"));
     EXPECT_EQ(log.GetLines()[0].tag, "mok_log");
     EXPECT_EQ(log.GetLines()[0].format, "%s Invalid framebuffer type");
-    use(*posted.Get());
-    use(*direct.Get());
+    for (BitmapPtr const& screen : {posted, direct}) {
+        Seen seen;
+        screen->GetPixelAsync(Point(1, 1), &seen, Seen::OnPixel);
+        queue.RunAll();
+        EXPECT_EQ(seen.pixel, 0u);
+    }
 }
 
 TEST_F(ScreenBitmap, RefusedOperationsKeepTheirReference) {

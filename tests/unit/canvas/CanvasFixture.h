@@ -13,6 +13,7 @@
 
 #include <functional>
 #include <limits>
+#include <sstream>
 #include <vector>
 
 namespace Moka::Testing {
@@ -20,7 +21,6 @@ namespace Moka::Testing {
 constexpr float kNaN = std::numeric_limits<float>::quiet_NaN();
 constexpr float kInfinity = std::numeric_limits<float>::infinity();
 
-using BitmapPtr = RefPtr<IMKBitmap>;
 using CanvasPtr = RefPtr<IMKCanvas>;
 using PenCanvasPtr = RefPtr<IMKPenCanvas>;
 using Numbers = std::vector<float>;
@@ -50,15 +50,29 @@ public:
 
 class CanvasFixture : public BitmapFixture {
 protected:
-    BitmapPtr NewBitmap(int width, int height) { return BitmapPtr::Adopt(Create(width, height)); }
+    void TearDown() override {
+        canvas = {};
+        target = {};
+        BitmapFixture::TearDown();
+    }
+
+    // The target and the canvas are these from now on, and everything so far has run and is forgotten.
+    void Use(BitmapPtr const& bitmap) {
+        target = bitmap;
+        target->SetTag("page");
+        canvas = NewCanvas(target);
+        queue.RunAll();
+        RecordingRenderer::TakeEvents();
+        RecordingRenderer::TakeCalls();
+    }
     BitmapPtr NewScreen(int width, int height) {
         return BitmapPtr::Adopt(MKGraphicsFactory::CreateScreenBitmap(&queue, 0, 0, width, height, 1, 1));
     }
-    CanvasPtr NewCanvas(BitmapPtr const& target) {
-        return CanvasPtr::Adopt(MKGraphicsFactory::CreateCanvas(&queue, target.Get(), 1));
+    CanvasPtr NewCanvas(BitmapPtr const& bitmap) {
+        return CanvasPtr::Adopt(MKGraphicsFactory::CreateCanvas(&queue, bitmap.Get(), 1));
     }
-    PenCanvasPtr NewPenCanvas(BitmapPtr const& target) {
-        return PenCanvasPtr::Adopt(MKGraphicsFactory::CreatePenCanvas(&queue, target.Get(), 1));
+    PenCanvasPtr NewPenCanvas(BitmapPtr const& bitmap) {
+        return PenCanvasPtr::Adopt(MKGraphicsFactory::CreatePenCanvas(&queue, bitmap.Get(), 1));
     }
 
     // Runs what was posted.
@@ -77,6 +91,23 @@ protected:
         EXPECT_EQ(draws.size(), 1u);
         return draws.empty() ? RecordedDraw() : draws.back();
     }
+    // The draws and clears, as text.
+    std::vector<std::string> TakePictures() {
+        std::vector<std::string> pictures;
+        for (RecordedEvent const& event : TakeEvents()) {
+            std::ostringstream text;
+            if (auto const* clear = std::get_if<RecordedClear>(&event)) {
+                for (float component : clear->color) text << component << ' ';
+            } else {
+                auto const& draw = std::get<RecordedDraw>(event);
+                text << draw.shader << ' ';
+                for (float number : draw.vertices) text << number << ' ';
+                for (auto const& [name, value] : draw.uniforms) text << name << '=' << value.text;
+            }
+            pictures.push_back(text.str());
+        }
+        return pictures;
+    }
     // The calls of one operation since the calls were last taken, with their objects.
     std::vector<std::string> TakeCalls(std::string const& operation) {
         queue.RunAll();
@@ -87,6 +118,8 @@ protected:
         return calls;
     }
 
+    BitmapPtr target;
+    CanvasPtr canvas;
     MKPaint paint;
     LogCapture log;
 };

@@ -58,31 +58,9 @@ TEST(PaintTest, TwoDashLengthsStandForFourAndOneTileModeForBothAxes) {
     EXPECT_EQ(paint.GetDashedLinePattern(), Color(1, 2, 3, 4));
     paint.ClearDashedLinePattern();
     EXPECT_EQ(paint.GetDashedLinePattern(), Color(-1, -1, -1, -1));
-
     paint.SetTileMode(static_cast<MKPaint::TileMode>(2));
     EXPECT_EQ(paint.GetTileModeX(), MKPaint::Mirror);
     EXPECT_EQ(paint.GetTileModeY(), MKPaint::Mirror);
-    paint.SetTileMode(MKPaint::Clamp, MKPaint::Repeat);
-    EXPECT_EQ(paint.GetTileModeX(), 1);
-    EXPECT_EQ(paint.GetTileModeY(), 3);
-}
-
-TEST(PaintTest, ACopyIsIndependentAndKeepsNumbersThatHaveNoName) {
-    MKPaint paint;
-    paint.SetXFermode(static_cast<MKPaint::XFermode>(25));
-    paint.SetStyle(static_cast<MKPaint::Style>(-7));
-    paint.SetLineCapType(static_cast<MKPaint::LineCapType>(99));
-    paint.SetLineWidth(-3.5f);
-    paint.SetAntiAliasing(true);
-    MKPaint const copy = paint;
-    paint = MKPaint();
-    EXPECT_EQ(copy.GetXFermode(), 25);
-    EXPECT_EQ(copy.GetStyle(), -7);
-    EXPECT_EQ(copy.GetLineCapType(), 99);
-    EXPECT_EQ(copy.GetLineWidth(), -3.5f);
-    EXPECT_TRUE(copy.IsAntiAliasing());
-    EXPECT_EQ(paint.GetXFermode(), MKPaint::SrcOver);
-    EXPECT_FALSE(paint.IsAntiAliasing());
 }
 
 } // namespace

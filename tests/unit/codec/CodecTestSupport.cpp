@@ -2,6 +2,7 @@
 
 #include "moka/base/Bitmap.h"
 #include "moka/base/String.h"
+#include "moka/base/codec/RowScaler.h"
 #include "moka/base/log/AndroidLog.h"
 
 #include <algorithm>
@@ -16,10 +17,6 @@
 namespace Moka::Testing {
 namespace {
 
-Image MakeImage(int width, int height) {
-    return {width, height, Bytes(static_cast<std::size_t>(width) * static_cast<std::size_t>(height) * 4)};
-}
-
 Image FromBitmap(Bitmap* bitmap) {
     std::unique_ptr<Bitmap> const owner(bitmap);
     if (!bitmap) return {};
@@ -31,6 +28,12 @@ Image FromBitmap(Bitmap* bitmap) {
 }
 
 } // namespace
+
+Image MakeImage(int width, int height) {
+    Image image{width, height, {}};
+    image.pixels.resize(image.GetStride() * static_cast<std::size_t>(height));
+    return image;
+}
 
 Image MakeTranslucentNoise(int width, int height, unsigned seed) {
     std::mt19937 random(seed);
@@ -44,12 +47,8 @@ Image MakeTranslucentNoise(int width, int height, unsigned seed) {
     return image;
 }
 
-Image MakeOpaqueNoise(int width, int height, unsigned seed) {
-    std::mt19937 random(seed);
-    Image image = MakeImage(width, height);
-    for (unsigned char& byte : image.pixels) byte = static_cast<unsigned char>(random());
-    for (std::size_t i = 3; i < image.pixels.size(); i += 4) image.pixels[i] = 255;
-    return image;
+Image MakeOpaqueNoise(int width, int height) {
+    return FlattenOnWhite(MakeTranslucentNoise(width, height, 1));
 }
 
 Image MakeGradient(int width, int height, bool isOpaque) {
@@ -75,6 +74,14 @@ Image FlattenOnWhite(Image image) {
             image.pixels[i + c] = static_cast<unsigned char>(image.pixels[i + c] + white);
     }
     return image;
+}
+
+Image Scale(Image const& source, int width, int height) {
+    Image result = MakeImage(width, height);
+    detail::RowScaler scaler({source.width, source.height}, {width, height}, result.pixels.data());
+    EXPECT_TRUE(scaler.IsReady());
+    for (int y = 0; y < source.height; ++y) scaler.Push(source.Row(y));
+    return result;
 }
 
 int LargestDifference(Image const& a, Image const& b) {
@@ -145,12 +152,25 @@ Image DecodeScaled(std::string const& path, int width, int height) {
     return FromBitmap(BitmapFactory::CreateBitmap(&text, width, height));
 }
 
+ImageInfo GetInfo(std::string const& path) {
+    String const text(path);
+    ImageInfo info;
+    EXPECT_TRUE(BitmapFactory::GetImageInfo(&text, &info)) << path;
+    return info;
+}
+
 bool Save(Image const& image, std::string const& path, int quality) {
     Bitmap bitmap;
     Bytes pixels = image.pixels;
     EXPECT_TRUE(bitmap.Construct(pixels.data(), image.width, image.height, image.width * 4, 1, false, false));
     String const text(path);
     return BitmapFactory::SaveBitmap(&bitmap, &text, quality);
+}
+
+std::string SaveIn(TempFolder const& folder, Image const& image, std::string const& extension) {
+    std::string const path = folder.Path("image." + extension);
+    EXPECT_TRUE(Save(image, path, 100)) << path;
+    return path;
 }
 
 Bytes Encode(Image const& image, std::string const& extension, int quality) {

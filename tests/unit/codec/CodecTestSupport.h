@@ -1,5 +1,4 @@
-// CodecTestSupport.h: pictures, temporary folders, captured log lines and counted pixel memory for the tests
-// of the image codecs.
+// CodecTestSupport.h: pictures, temporary folders and captured log lines for the tests of the image codecs.
 #pragma once
 
 #include "moka/base/BitmapFactory.h"
@@ -18,22 +17,26 @@ struct Image {
     int height = 0;
     Bytes pixels; // RGBA8, premultiplied; empty when there is no image
 
-    unsigned char const* At(int x, int y) const {
-        return &pixels[(static_cast<std::size_t>(y) * static_cast<std::size_t>(width) +
-                        static_cast<std::size_t>(x)) *
-                       4];
+    std::size_t GetStride() const { return static_cast<std::size_t>(width) * 4; } // bytes
+    unsigned char const* Row(int y) const {
+        return pixels.data() + static_cast<std::size_t>(y) * GetStride();
     }
     friend bool operator==(Image const& a, Image const& b) {
         return a.width == b.width && a.height == b.height && a.pixels == b.pixels;
     }
 };
 
+// Transparent.
+Image MakeImage(int width, int height);
 // Every alpha occurs, and colours from 0 up to it.
 Image MakeTranslucentNoise(int width, int height, unsigned seed = 1);
-Image MakeOpaqueNoise(int width, int height, unsigned seed = 1);
+Image MakeOpaqueNoise(int width, int height);
 // Smooth, so that lossy codecs come close.
 Image MakeGradient(int width, int height, bool isOpaque);
 Image FlattenOnWhite(Image image);
+
+// As the codecs' own scaler does it.
+Image Scale(Image const& source, int width, int height);
 
 // The greatest difference of any byte; 256 when the sizes differ.
 int LargestDifference(Image const& a, Image const& b);
@@ -75,8 +78,12 @@ private:
 Image Decode(Bytes const& file, char const* name = "test");
 Image DecodeFile(std::string const& path);
 Image DecodeScaled(std::string const& path, int width, int height);
+// Fails the test when the factory finds none.
+ImageInfo GetInfo(std::string const& path);
 bool Save(Image const& image, std::string const& path, int quality);
-// Through a file; fails the test when it cannot be saved.
+// As image.EXTENSION; fails the test when it cannot be saved. Returns the path.
+std::string SaveIn(TempFolder const& folder, Image const& image, std::string const& extension);
+// The file's bytes.
 Bytes Encode(Image const& image, std::string const& extension, int quality = 100);
 
 // Edits in a copy.

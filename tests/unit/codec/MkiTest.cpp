@@ -51,21 +51,19 @@ Bytes Compress(Bytes const& content, int level = 1, bool hasChecksum = true, boo
 TEST(Mki, ReadsFilesMadeByTheBook) {
     ErrorLines const errors;
     Image const image = MakeTranslucentNoise(3, 2);
-    EXPECT_EQ(Decode(MakeMki({3, 2, 1, 1}, Compress(image.pixels))), image);
-    EXPECT_EQ(Decode(MakeMki({3, 2, 1, 1}, Compress(image.pixels, 19))), image);
+    for (int const level : {1, 19}) EXPECT_EQ(Decode(MakeMki({3, 2}, Compress(image.pixels, level))), image);
     EXPECT_EQ(Decode(MakeMki({3, 2, 1, 0}, image.pixels)), image) << "stored";
     Image const invalid{1, 1, {9, 200, 0, 5}};
     EXPECT_EQ(Decode(MakeMki({1, 1, 1, 0}, invalid.pixels)), invalid) << "pixels are taken as they are";
 }
 
-TEST(Mki, WritesTheHeaderByTheBook) {
+TEST(Mki, WritesFilesByTheBook) {
     Image const image = MakeTranslucentNoise(700, 301);
     Bytes const file = Encode(image, "mki");
     Bytes const payload(file.begin() + 32, file.end());
-    EXPECT_EQ(file, MakeMki({700, 301, 1, 1}, payload));
+    EXPECT_EQ(file, MakeMki({700, 301}, payload));
     Bytes content(image.pixels.size());
-    EXPECT_EQ(ZSTD_decompress(content.data(), content.size(), payload.data(), payload.size()),
-              content.size());
+    ZSTD_decompress(content.data(), content.size(), payload.data(), payload.size());
     EXPECT_EQ(content, image.pixels);
     EXPECT_TRUE(payload[4] & 4) << "the content checksum is off";
 }
@@ -76,9 +74,7 @@ TEST(Mki, RefusesWhateverDoesNotAddUp) {
     Bytes const longer(28, 1);
     Bytes badCheck = frame;
     badCheck.back() ^= 1;
-    Bytes const two = Insert(frame, frame.size(), frame);
-    Bytes skippable = {0x50, 0x2A, 0x4D, 0x18, 4, 0, 0, 0, 1, 2, 3, 4};
-    skippable.insert(skippable.end(), frame.begin(), frame.end());
+    Bytes const skippable = Insert(frame, 0, {0x50, 0x2A, 0x4D, 0x18, 4, 0, 0, 0, 1, 2, 3, 4});
     struct {
         Bytes file;
         char const* reason;
@@ -90,7 +86,6 @@ TEST(Mki, RefusesWhateverDoesNotAddUp) {
         {MakeMki({3, 2, 1, 1, 0, 1}, frame), "not zero"},
         {MakeMki({0, 2}, frame), "below 1"},
         {MakeMki({3, 0}, frame), "below 1"},
-        {MakeMki({65536, 2}, frame), "65535"},
         {MakeMki({0xFFFFFFFF, 0xFFFFFFFF}, frame), "65535"},
         {MakeMki({65535, 65535}, frame), "1 GiB"},
         {MakeMki({2, 2}, frame), "does not fit"},
@@ -100,16 +95,15 @@ TEST(Mki, RefusesWhateverDoesNotAddUp) {
         {MakeMki({3, 2}, Compress(pixels, 1, false)), "no checksum"},
         {MakeMki({3, 2}, Compress(pixels, 1, true, false)), "does not fit"},
         {MakeMki({3, 2}, badCheck), "damaged"},
-        {MakeMki({3, 2}, two), "behind its end"},
+        {MakeMki({3, 2}, Insert(frame, 0, frame)), "behind its end"},
         {MakeMki({3, 2}, skippable), "does not fit"},
         {MakeMki({3, 2}, {}), "no Zstandard frame"},
         {MakeMki({3, 2}, longer), "no Zstandard frame"},
     };
     ErrorLines errors;
     for (auto const& one : cases) {
-        EXPECT_TRUE(Decode(one.file, "bad.mki").pixels.empty()) << one.reason;
-        EXPECT_THAT(errors.Take(),
-                    ElementsAre(::testing::AllOf(HasSubstr("bad.mki"), HasSubstr(one.reason))));
+        EXPECT_TRUE(Decode(one.file).pixels.empty()) << one.reason;
+        EXPECT_THAT(errors.Take(), ElementsAre(HasSubstr(one.reason)));
     }
 }
 

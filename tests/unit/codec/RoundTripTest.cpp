@@ -11,13 +11,11 @@ namespace {
 
 TEST(RoundTrip, LosslessFormatsKeepEveryPremultipliedPixel) {
     // Every valid pair of colour and alpha, and shapes that leave odd rows.
-    Image everyPair{256, 256, {}};
-    for (int a = 0; a < 256; ++a) {
-        for (int c = 0; c < 256; ++c) {
-            auto const colour = static_cast<unsigned char>(std::min(a, c));
-            everyPair.pixels.insert(everyPair.pixels.end(),
-                                    {colour, 0, colour, static_cast<unsigned char>(a)});
-        }
+    Image everyPair = MakeImage(256, 256);
+    for (std::size_t i = 0; i < 256 * 256; ++i) {
+        unsigned char* const pixel = &everyPair.pixels[i * 4];
+        pixel[3] = static_cast<unsigned char>(i / 256);
+        pixel[0] = pixel[2] = std::min(pixel[3], static_cast<unsigned char>(i % 256));
     }
     Image const images[] = {everyPair,
                             MakeTranslucentNoise(1, 1),
@@ -51,8 +49,8 @@ TEST(RoundTrip, LossyFormatsComeClose) {
 TEST(RoundTrip, HonoursAStrideWiderThanTheRow) {
     Image const image = MakeTranslucentNoise(37, 11);
     constexpr int kStride = 37 * 4 + 20;
-    Bytes padded(static_cast<std::size_t>(kStride * 11), 0xEE);
-    for (int y = 0; y < 11; ++y) std::copy_n(image.At(0, y), 37 * 4, padded.begin() + y * kStride);
+    Bytes padded(kStride * 11, 0xEE);
+    for (int y = 0; y < 11; ++y) std::copy_n(image.Row(y), 37 * 4, padded.begin() + y * kStride);
     Bitmap bitmap;
     ASSERT_TRUE(bitmap.Construct(padded.data(), 37, 11, kStride, 1, false, false));
     TempFolder const folder;
@@ -69,17 +67,13 @@ TEST(RoundTrip, InfoTellsTheHeaderWithoutThePixels) {
     for (bool const isOpaque : {true, false}) {
         Image const image = MakeGradient(300, 200, isOpaque);
         for (char const* extension : {"png", "webp", "mki", "jpg"}) {
-            std::string const path = folder.Path(std::string("image.") + extension);
-            ASSERT_TRUE(Save(image, path, 100));
+            std::string const path = SaveIn(folder, image, extension);
             Bytes bytes = ReadFile(path);
             std::string const kind = extension;
             // "mki" states the payload's length in its header, so there a short file is known at once.
             if (kind != "mki") bytes.resize(bytes.size() / 2);
             WriteFile(path, bytes);
-            String const text(path);
-            ImageInfo info;
-            ASSERT_TRUE(BitmapFactory::GetImageInfo(&text, &info)) << extension;
-            EXPECT_EQ(info.format, BitmapFactory::GetFormatByExtension(&text));
+            ImageInfo const info = GetInfo(path);
             EXPECT_EQ(info.width, 300);
             EXPECT_EQ(info.height, 200);
             EXPECT_EQ(info.hasAlpha, kind == "mki" || (kind != "jpg" && !isOpaque)) << extension;
@@ -104,10 +98,7 @@ TEST(RoundTrip, ContentDecidesWhenReadingAndTheExtensionWhenWriting) {
         EXPECT_EQ(BitmapFactory::GetFormatByExtension(&text), one.format) << one.name;
         ASSERT_TRUE(Save(image, folder.Path(one.name), 100));
         WriteFile(folder.Path("misnamed.png"), ReadFile(folder.Path(one.name)));
-        String const misnamed(folder.Path("misnamed.png"));
-        ImageInfo info;
-        ASSERT_TRUE(BitmapFactory::GetImageInfo(&misnamed, &info));
-        EXPECT_EQ(info.format, one.format) << one.name;
+        EXPECT_EQ(GetInfo(folder.Path("misnamed.png")).format, one.format) << one.name;
         EXPECT_FALSE(DecodeFile(folder.Path("misnamed.png")).pixels.empty());
     }
     for (char const* name : {"x.gif", "png", "x.", "x.png/y", "x.pngx", ""}) {
@@ -123,8 +114,7 @@ TEST(RoundTrip, DecodingHoldsOneCopyOfThePixels) {
     constexpr std::size_t kSlack = 128 * 1024;              // a block of the file, rows, weights
     Image const image = MakeTranslucentNoise(kSide, kSide); // hardly compresses
     for (char const* extension : {"png", "webp", "mki", "jpg"}) {
-        std::string const path = folder.Path(std::string("image.") + extension);
-        ASSERT_TRUE(Save(image, path, 100));
+        std::string const path = SaveIn(folder, image, extension);
         String const text(path);
         std::size_t const before = ArrayMemory::GetLive();
         auto const peakOf = [&](int side) {

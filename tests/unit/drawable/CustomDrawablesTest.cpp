@@ -14,8 +14,6 @@ namespace Moka::Testing {
 namespace {
 
 using ::testing::ElementsAre;
-using ::testing::IsEmpty;
-using ::testing::SizeIs;
 
 class CustomDrawablesTest : public BitmapFixture {
 protected:
@@ -23,8 +21,8 @@ protected:
 
     void SetUp() override {
         BitmapFixture::SetUp();
-        first = RefPtr<IMKBitmap>::Adopt(Create(40, 20));
-        second = RefPtr<IMKBitmap>::Adopt(Create(8, 8));
+        first = NewBitmap(40, 20);
+        second = NewBitmap(8, 8);
         queue.RunAll();
         paint = CommonPaint();
         paint.SetTileMode(MKPaint::Repeat);
@@ -72,35 +70,28 @@ protected:
         EXPECT_NE(RecordingRenderer::TakeCalls().empty(), draws);
         return draws;
     }
-    // One draw, with the states, tiling and projection that all have in common.
-    RecordedDraw Draw(IMKCustomDrawable& drawable, char const* projectionName) {
+    // One draw, with the states and the tiling that all have in common.
+    RecordedDraw Draw(IMKCustomDrawable& drawable) {
         OnRenderThread const here;
         ForceStencil();
         RecordingRenderer::TakeEvents();
         drawable.DrawRT(projection, paint);
         std::vector<RecordedDraw> const draws = RecordingRenderer::GetDraws();
-        if (draws.size() != 1) {
-            ADD_FAILURE() << draws.size() << " draws";
-            return {};
-        }
+        EXPECT_EQ(draws.size(), 1u);
+        if (draws.empty()) return {};
         EXPECT_FALSE(draws[0].state.depthStencil.IsStencil());
         EXPECT_EQ(draws[0].state.blend.GetColorEquation().destination, BlendingFactor::SrcAlpha);
-        EXPECT_EQ(Values(draws[0], {projectionName}), "2 0 0 0 0 3 0 0 0 0 1 0 -1 0.5 0 1");
         EXPECT_EQ(draws[0].textures.at(0), RecordingRenderer::NameOf(TextureOf(first)));
-        EXPECT_EQ(RecordingRenderer::GetParameter(TextureOf(first), TextureParamWrappingS),
-                  TextureWrapRepeat);
-        EXPECT_EQ(RecordingRenderer::GetParameter(TextureOf(first), TextureParamWrappingT),
-                  TextureWrapRepeat);
+        for (int axis : {TextureParamWrappingS, TextureParamWrappingT})
+            EXPECT_EQ(RecordingRenderer::GetParameter(TextureOf(first), axis), TextureWrapRepeat);
         return draws[0];
     }
-    static ITextureObject* TextureOf(RefPtr<IMKBitmap> const& bitmap) {
-        return bitmap->GetTextureBitmap()->GetSubBitmap(0)->GetTexture();
-    }
+    static ITextureObject* TextureOf(BitmapPtr const& bitmap) { return StripOf(bitmap)->GetTexture(); }
 
     Matrix4<float> const projection{2, 0, 0, 0, 0, 3, 0, 0, 0, 0, 1, 0, -1, 0.5f, 0, 1};
     MKPaint paint;
-    RefPtr<IMKBitmap> first;
-    RefPtr<IMKBitmap> second;
+    BitmapPtr first;
+    BitmapPtr second;
 };
 
 TEST_F(CustomDrawablesTest, GpuObjectsAreMadeAndReleasedByTasksInOrder) {
@@ -143,24 +134,9 @@ TEST_F(CustomDrawablesTest, ARefusedConstructionLeavesADrawableThatDrawsNothingA
     EXPECT_EQ(picky.GetRefusedCount(), 4);
 }
 
-TEST_F(CustomDrawablesTest, WhatTheRendererRefusedIsNeitherDrawnWithNorReleased) {
-    for (ObjectKind kind :
-         {ObjectKind::GraphicsObject, ObjectKind::BlendState, ObjectKind::DepthStencilState}) {
-        for (Maker const& make : Makers()) {
-            RecordingRenderer::FailCreations(kind);
-            auto drawable = Constructed(make(&queue));
-            RecordingRenderer::StopFailing();
-            EXPECT_FALSE(Draws(*drawable));
-            drawable = {};
-            EXPECT_EQ(queue.RunAll(), 3);
-        }
-    }
-}
-
 TEST_F(CustomDrawablesTest, ARefusedReleaseLeaksThatObjectAndNothingElse) {
     RefusingQueue refusesTheProgram({5}); // after the construction and three releases
-    refusesTheProgram.SetAroundRun([] { RecordingRenderer::DeclareRenderThread(); },
-                                   [] { RecordingRenderer::DeclareNoRenderThread(); });
+    RunOnRenderThread(refusesTheProgram);
     int const alive = RecordingRenderer::CountLiveObjects();
     Makers()[2](&refusesTheProgram)->Unref();
     refusesTheProgram.RunAll();
@@ -195,25 +171,60 @@ TEST_F(CustomDrawablesTest, SettersTakeReferencesAndAConstructorAdoptsThem) {
     EXPECT_FALSE(Draws(*Constructed(New<MKGaussianBlurDrawable>(&queue))));
 }
 
-TEST_F(CustomDrawablesTest, ABlendMixesTwoBitmapsByThePaintsAlpha) {
-    auto const drawable = Constructed(NewBlended(&queue, 0, 0));
-    RecordedDraw draw = Draw(*drawable, "uProjectionMatrix");
-    EXPECT_EQ(draw.shader, "MKBlenderBitmapsShader");
-    EXPECT_EQ(draw.primitive, PrimitiveType::TriangleList);
-    std::vector<Vertex> const whole = {{1, 2, 1, 0.25f, 0.25f}, {1, 4, 1, 0.25f, 0.75f},
-                                       {3, 2, 1, 0.75f, 0.25f}, {3, 2, 1, 0.75f, 0.25f},
-                                       {1, 4, 1, 0.25f, 0.75f}, {3, 4, 1, 0.75f, 0.75f}};
-    EXPECT_EQ(VerticesOf(draw), whole);
-    EXPECT_EQ(Values(draw, {"uFactor", "uSrcTexture1", "uSrcTexture2", "uHasTintColor"}), "0.75 | 0 | 1 | 1");
+TEST_F(CustomDrawablesTest, EachDrawsItsRectangleWithItsUniforms) {
+    using Names = std::vector<std::string>; // of uniforms, the projection's first
+    auto const expect = [&](IMKCustomDrawable& drawable, char const* shader,
+                            std::vector<float> const& vertices, Names const& uniforms,
+                            std::string const& values) {
+        SCOPED_TRACE(shader);
+        RecordedDraw const draw = Draw(drawable);
+        EXPECT_EQ(draw.shader, shader);
+        bool const isStrip = draw.count == 4;
+        EXPECT_EQ(draw.primitive, isStrip ? PrimitiveType::TriangleStrip : PrimitiveType::TriangleList);
+        EXPECT_EQ(draw.vertices, vertices);
+        EXPECT_EQ(Values(draw, uniforms), "2 0 0 0 0 3 0 0 0 0 1 0 -1 0.5 0 1 | " + values);
+        return draw;
+    };
+    auto const blend = Constructed(NewBlended(&queue, 0, 0));
+    RecordedDraw draw =
+        expect(*blend, "MKBlenderBitmapsShader",
+               {1, 2, 1, 0.25f, 0.25f, 1, 4, 1, 0.25f, 0.75f, 3, 2, 1, 0.75f, 0.25f,
+                3, 2, 1, 0.75f, 0.25f, 1, 4, 1, 0.25f, 0.75f, 3, 4, 1, 0.75f, 0.75f},
+               {"uProjectionMatrix", "uFactor", "uSrcTexture1", "uSrcTexture2", "uHasTintColor"},
+               "0.75 | 0 | 1 | 1");
     EXPECT_EQ(draw.textures.at(1), RecordingRenderer::NameOf(TextureOf(second)));
 
-    // The size of the first draw stays; one that is set is taken as it is, also when only one side is 0.
+    auto const over = Constructed(New<MKNonPremultipliedColorDrawable>(&queue, first.Get(), second.Get()));
+    draw =
+        expect(*over, "MKNonPremultipliedColorShader", {0, 0, 0, 0, 0, 20, 0, 1, 40, 0, 1, 0, 40, 20, 1, 1},
+               {"projectionMatrix", "srcTexture", "dstTexture"}, "0 | 1");
+    EXPECT_EQ(draw.textures.at(1), RecordingRenderer::NameOf(TextureOf(second)));
+
+    auto const mask = Constructed(New<MKTextMaskBitmapDrawable>(&queue, first.Get()));
+    mask->SetDstPosition(2.5f, -3);
+    expect(*mask, "MKTextMaskBitmapShader", {2.5f,  -3, 0, 0, 2.5f, 17, 0, 1, 42.5f, -3, 1, 0,
+                                             42.5f, -3, 1, 0, 2.5f, 17, 0, 1, 42.5f, 17, 1, 1},
+           {"uProjectionMatrix", "uMaskColor", "uSrcTexture"}, "0.5 0.25 0.125 0.75 | 0");
+
+    auto const blur = Constructed(New<MKGaussianBlurDrawable>(&queue, first.Get()));
+    Names const names = {"projectionMatrix", "isHorizontal", "blurAmount", "uTintColor", "uHasTintColor"};
+    EXPECT_EQ(Values(Draw(*blur), {"isHorizontal", "blurAmount"}), "1 | 1");
+    blur->SetHorizotalDirection(false);
+    blur->SetBlurAmount(2.5f);
+    blur->SetOffset(20, -5);
+    expect(*blur, "MKGaussianBlurShader",
+           {0, 0, -0.5f, 0.25f, 0, 20, -0.5f, 1.25f, 40, 0, 0.5f, 0.25f, 40, 20, 0.5f, 1.25f}, names,
+           "0 | 2.5 | 1 0 0.5 0.25 | 1");
+}
+
+TEST_F(CustomDrawablesTest, ABlendKeepsTheSizeOfItsFirstDraw) {
+    auto const drawable = Constructed(NewBlended(&queue, 0, 0));
+    std::vector<float> const whole = Draw(*drawable).vertices;
     std::swap(first, second);
     drawable->SetBitmapFirst(first.Get());
-    EXPECT_EQ(VerticesOf(Draw(*drawable, "uProjectionMatrix")), whole);
-    drawable->SetSize(80, 0);
-    EXPECT_THAT(VerticesOf(Draw(*drawable, "uProjectionMatrix")).front(),
-                ElementsAre(1, 2, 1, 0.125f, kInfinity));
+    EXPECT_EQ(Draw(*drawable).vertices, whole);
+    drawable->SetSize(80, 0); // taken as it is, also when only one side is 0
+    EXPECT_THAT(VerticesOf(Draw(*drawable)).front(), ElementsAre(1, 2, 1, 0.125f, kInfinity));
 
     for (RectF const& empty : {RectF(1, 1, 1, 5), RectF(5, 5, 1, 9), RectF(0, 0, kNaN, 5)}) {
         drawable->SetRects(empty, RectF(0, 0, 5, 5));
@@ -221,47 +232,6 @@ TEST_F(CustomDrawablesTest, ABlendMixesTwoBitmapsByThePaintsAlpha) {
         drawable->SetRects(RectF(0, 0, 5, 5), empty);
         EXPECT_FALSE(Draws(*drawable));
     }
-}
-
-TEST_F(CustomDrawablesTest, NonPremultipliedColorIsTheWholeSourceAtTheOrigin) {
-    auto const drawable =
-        Constructed(New<MKNonPremultipliedColorDrawable>(&queue, first.Get(), second.Get()));
-    RecordedDraw const draw = Draw(*drawable, "projectionMatrix");
-    EXPECT_EQ(draw.shader, "MKNonPremultipliedColorShader");
-    EXPECT_EQ(draw.primitive, PrimitiveType::TriangleStrip);
-    EXPECT_THAT(VerticesOf(draw), ElementsAre(Vertex{0, 0, 0, 0}, Vertex{0, 20, 0, 1}, Vertex{40, 0, 1, 0},
-                                              Vertex{40, 20, 1, 1}));
-    EXPECT_EQ(Values(draw, {"srcTexture", "dstTexture"}), "0 | 1");
-    EXPECT_EQ(draw.textures.at(1), RecordingRenderer::NameOf(TextureOf(second)));
-}
-
-TEST_F(CustomDrawablesTest, ATextMaskIsPaintedInTheColourAtItsPosition) {
-    auto const drawable = Constructed(New<MKTextMaskBitmapDrawable>(&queue, first.Get()));
-    EXPECT_THAT(VerticesOf(Draw(*drawable, "uProjectionMatrix")).front(), ElementsAre(0, 0, 0, 0));
-    drawable->SetDstPosition(2.5f, -3);
-    RecordedDraw const draw = Draw(*drawable, "uProjectionMatrix");
-    EXPECT_EQ(draw.shader, "MKTextMaskBitmapShader");
-    EXPECT_EQ(draw.primitive, PrimitiveType::TriangleList);
-    EXPECT_THAT(VerticesOf(draw),
-                ElementsAre(Vertex{2.5f, -3, 0, 0}, Vertex{2.5f, 17, 0, 1}, Vertex{42.5f, -3, 1, 0},
-                            Vertex{42.5f, -3, 1, 0}, Vertex{2.5f, 17, 0, 1}, Vertex{42.5f, 17, 1, 1}));
-    EXPECT_EQ(Values(draw, {"uMaskColor", "uSrcTexture"}), "0.5 0.25 0.125 0.75 | 0");
-}
-
-TEST_F(CustomDrawablesTest, ABlurIsOneDirectionShiftedByItsOffset) {
-    auto const drawable = Constructed(New<MKGaussianBlurDrawable>(&queue, first.Get()));
-    RecordedDraw draw = Draw(*drawable, "projectionMatrix");
-    EXPECT_EQ(draw.shader, "MKGaussianBlurShader");
-    EXPECT_EQ(draw.primitive, PrimitiveType::TriangleStrip);
-    EXPECT_EQ(Values(draw, {"isHorizontal", "blurAmount", "uTintColor", "uHasTintColor", "srcTexture"}),
-              "1 | 1 | 1 0 0.5 0.25 | 1 | 0");
-    drawable->SetHorizotalDirection(false);
-    drawable->SetBlurAmount(2.5f);
-    drawable->SetOffset(20, -5);
-    draw = Draw(*drawable, "projectionMatrix");
-    EXPECT_THAT(VerticesOf(draw), ElementsAre(Vertex{0, 0, -0.5f, 0.25f}, Vertex{0, 20, -0.5f, 1.25f},
-                                              Vertex{40, 0, 0.5f, 0.25f}, Vertex{40, 20, 0.5f, 1.25f}));
-    EXPECT_EQ(Values(draw, {"isHorizontal", "blurAmount"}), "0 | 2.5");
 }
 
 } // namespace

@@ -1,6 +1,4 @@
 #include "moka/graphics/drawable/ShaderExceptions.h"
-#include "moka/graphics/task/WorkerTask.h"
-#include "tests/support/Queues.h"
 #include "tests/unit/drawable/ShaderFixture.h"
 
 #include <atomic>
@@ -141,16 +139,6 @@ TEST_F(ShaderManagerTest, WithoutMemoryTheEntryIsThereAndTheShaderIsNull) {
     EXPECT_EQ(manager.GetShader<NoMemoryShader>(), nullptr);
     EXPECT_THAT(log.GetTexts(), IsEmpty());
     manager.RemoveShader(ShaderManager::Key(typeid(NoMemoryShader).name()));
-}
-
-TEST_F(ShaderManagerTest, TheReleaseTravelsAsATask) {
-    HandPumpedQueue queue;
-    auto* const shader = manager.GetShader<MKLineShader>();
-    EXPECT_TRUE(
-        WorkerTask::PostMember(&queue, &manager, &ShaderManager::ReleaseShader<MKLineShader>, shader));
-    EXPECT_EQ(CountPrograms(), 1);
-    queue.RunAll();
-    EXPECT_EQ(CountPrograms(), 0);
 }
 
 struct SlowShader {

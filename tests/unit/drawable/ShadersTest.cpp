@@ -1,8 +1,7 @@
-// The twelve classes: what they ask the renderer for, in which order, and what reaches it.
+// A class with a uniform of each kind: in which order they are bound, and what reaches the renderer. That the
+// twelve classes fit their programs is tested with a driver.
 #include "moka/graphics/drawable/ShaderExceptions.h"
 #include "tests/unit/drawable/ShaderFixture.h"
-
-#include <algorithm>
 
 namespace Moka::Testing {
 
@@ -23,74 +22,19 @@ MOKA_SHADER_DEFINITION(EveryKindShader, EVERY_KIND_UNIFORMS, "uniform mat4 matri
 namespace {
 
 using ::testing::ElementsAre;
-using ::testing::ElementsAreArray;
 using ::testing::IsEmpty;
-using ::testing::StartsWith;
 
-class ShadersTest : public ShaderFixture {
-protected:
-    // uniforms: name and type, as the renderer is asked.
-    template <class T>
-    static void Expect(char const* name, std::vector<std::string> const& uniforms) {
-        RecordingRenderer::Reset();
-        RendererFactory::AttachContext();
-        std::vector<std::string> made = {"program 1 Create " + std::string(name)};
-        std::vector<std::string> released;
-        for (std::string const& uniform : uniforms) {
-            made.push_back("program 1 GetParameter " + uniform);
-            released.push_back("program 1 ReleaseParameter " + uniform.substr(0, uniform.find(' ')));
-        }
-        released.push_back("program 1 Release");
-        std::reverse(released.begin(), released.end());
-        auto* const shader = ShaderManager::GetInstance()->GetShader<T>();
-        EXPECT_THAT(RecordingRenderer::TakeCalls(), ElementsAreArray(made)) << name;
-        ShaderManager::GetInstance()->ReleaseShader(shader);
-        EXPECT_THAT(RecordingRenderer::TakeCalls(), ElementsAreArray(released)) << name;
-        EXPECT_THAT(RecordingRenderer::GetViolations(), IsEmpty());
-    }
-};
-
-TEST_F(ShadersTest, EachClassCompilesUnderItsNameAndBindsItsUniformsInOrder) {
-    std::vector<std::string> const color = {"uProjectionMatrix 2", "uColor 5", "uTintColor 5",
-                                            "uHasTintColor 7"};
-    auto const colorAnd = [&](std::vector<std::string> const& more) {
-        std::vector<std::string> all = color;
-        all.insert(all.end(), more.begin(), more.end());
-        return all;
-    };
-    std::vector<std::string> const bitmap = {"uProjectionMatrix 2", "uSrcTexture 8", "uColor 5",
-                                             "uTintColor 5", "uHasTintColor 7"};
-    Expect<MKRectShader>("MKRectShader", color);
-    Expect<MKRoundRectShader>("MKRoundRectShader", color);
-    Expect<MKRoundRectRoundShader>("MKRoundRectRoundShader",
-                                   colorAnd({"uIsFill 7", "uStrokeWidth 6", "uRxry 3"}));
-    Expect<MKCircleShader>("MKCircleShader",
-                           colorAnd({"uIsFill 7", "uStrokeWidth 6", "uCenter 3", "uRadius 6"}));
-    Expect<MKLineShader>("MKLineShader", colorAnd({"uLineInfo 3", "uIsDashedLine 7", "uDashedLinePattern 5",
-                                                   "uDashedLinePatternLength 6", "uLineCapType 7"}));
-    Expect<MKBitmapShader>("MKBitmapShader", bitmap);
-    Expect<MKBitmapShaderColorClamp>("MKBitmapShaderColorClamp", bitmap);
-    Expect<MKBitmapAdvancedBlendingShader>("MKBitmapAdvancedBlendingShader",
-                                           {"uProjectionMatrix 2", "uSrcTexture 8", "uDstTexture 8",
-                                            "uColor 5", "uTintColor 5", "uDstTextureSize 3",
-                                            "uHasTintColor 7", "uBlendingMode 7"});
-    Expect<MKBlenderBitmapsShader>("MKBlenderBitmapsShader",
-                                   {"uProjectionMatrix 2", "uSrcTexture1 8", "uSrcTexture2 8", "uFactor 6",
-                                    "uColor 5", "uTintColor 5", "uHasTintColor 7"});
-    Expect<MKTextMaskBitmapShader>("MKTextMaskBitmapShader",
-                                   {"uProjectionMatrix 2", "uSrcTexture 8", "uMaskColor 5"});
-    Expect<MKNonPremultipliedColorShader>("MKNonPremultipliedColorShader",
-                                          {"projectionMatrix 2", "srcTexture 8", "dstTexture 8"});
-    Expect<MKGaussianBlurShader>("MKGaussianBlurShader",
-                                 {"projectionMatrix 2", "srcTexture 8", "uTintColor 5", "uHasTintColor 7",
-                                  "isHorizontal 1", "blurAmount 6"});
-}
+class ShadersTest : public ShaderFixture {};
 
 TEST_F(ShadersTest, AssignedValuesReachTheProgramAndMissingUniformsSwallowThem) {
     {
-        EveryKindShader shader;
-        EXPECT_THAT(log.GetTexts(), IsEmpty());
         RecordingRenderer::TakeCalls();
+        EveryKindShader shader;
+        std::string const get = "program 1 GetParameter ";
+        EXPECT_THAT(RecordingRenderer::TakeCalls(),
+                    ElementsAre("program 1 Create EveryKindShader", get + "flag 1", get + "matrix 2",
+                                get + "pair 3", get + "color 5", get + "number 6", get + "count 7",
+                                get + "texture 8", get + "missing 0"));
         shader.program->MakeCurrent();
         shader.flag = true;
         shader.matrix = Matrix4<float>(1, 2, 3, 4, 5, 6, 7, 8, 9, 10, 11, 12, 13, 14, 15, 16);
@@ -112,8 +56,12 @@ TEST_F(ShadersTest, AssignedValuesReachTheProgramAndMissingUniformsSwallowThem) 
         EXPECT_EQ(value("count"), "-3");
         EXPECT_EQ(value("texture"), "2");
         EXPECT_EQ(RecordingRenderer::CountCalls("SetParameter"), 9);
+        RecordingRenderer::TakeCalls();
     }
     EXPECT_EQ(RecordingRenderer::GetCurrentProgram(), "none");
+    std::vector<std::string> const calls = RecordingRenderer::TakeCalls(); // backwards
+    EXPECT_EQ(calls.front(), "program 1 Release");
+    EXPECT_EQ(calls.back(), "program 1 ReleaseParameter flag");
     EXPECT_THAT(log.GetTexts(), IsEmpty());
 }
 

@@ -18,8 +18,8 @@ class QueueThread final : public TaskQueue {
 public:
     ~QueueThread() override { Stop(); }
 
-    void Start(std::function<void()> onIdle = {}) {
-        mThread = std::thread([this, idle = std::move(onIdle)] { Run(idle); });
+    void Start() {
+        mThread = std::thread([this] { Run({}); });
     }
     void Stop() {
         RequestStop();

@@ -4,6 +4,7 @@
 
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <array>
 #include <atomic>
 #include <cstdint>
@@ -13,7 +14,6 @@
 #include <set>
 #include <stdexcept>
 #include <thread>
-#include <utility>
 #include <vector>
 
 namespace Moka::Testing {
@@ -36,10 +36,7 @@ struct Block {
         return {memory, size, mark};
     }
     bool IsIntact() const {
-        for (std::size_t i = 0; i < size; ++i) {
-            if (memory[i] != mark) return false;
-        }
-        return true;
+        return std::all_of(memory, memory + size, [this](unsigned char byte) { return byte == mark; });
     }
     void Free() const { FreeTask(memory, size); }
 };
@@ -60,41 +57,37 @@ TEST(TaskMemoryTest, GivesBlocksOfTheirOwnOnCacheLinesOfTheirOwn) {
 }
 
 TEST(TaskMemoryTest, BlocksFreedOnAnotherThreadAreIntactAndComeBackOnce) {
-    struct Channel {
-        std::mutex mutex;
-        std::vector<Block> blocks;
-    };
-    constexpr int kPairs = 3;
     constexpr int kBlocks = 20000;
-    std::array<Channel, kPairs> channels;
     std::atomic<int> broken{0};
-    std::vector<std::thread> threads;
-    for (int pair = 0; pair < kPairs; ++pair) {
-        Channel& channel = channels[static_cast<std::size_t>(pair)];
-        threads.emplace_back([&channel, pair] {
+    // One thread fills blocks, another one frees them.
+    auto const exchange = [&broken](int pair) {
+        std::mutex mutex;
+        std::vector<Block> filled;
+        std::thread filler([&] {
             for (int i = 0; i < kBlocks; ++i) {
                 std::size_t const size = kSizes[static_cast<std::size_t>(i + pair) % std::size(kSizes)];
-                Block const block = Block::Make(size, static_cast<unsigned char>(i * kPairs + pair));
-                std::lock_guard<std::mutex> const lock(channel.mutex);
-                channel.blocks.push_back(block);
+                Block const block = Block::Make(size, static_cast<unsigned char>(3 * i + pair));
+                std::lock_guard<std::mutex> const lock(mutex);
+                filled.push_back(block);
             }
         });
-        threads.emplace_back([&channel, &broken] {
-            for (int freed = 0; freed < kBlocks;) {
-                std::vector<Block> taken;
-                {
-                    std::lock_guard<std::mutex> const lock(channel.mutex);
-                    taken.swap(channel.blocks);
-                }
-                for (Block const& block : taken) {
-                    if (!block.IsIntact()) ++broken;
-                    block.Free();
-                }
-                freed += static_cast<int>(taken.size());
-                if (taken.empty()) std::this_thread::yield();
+        for (int freed = 0; freed < kBlocks;) {
+            std::vector<Block> taken;
+            {
+                std::lock_guard<std::mutex> const lock(mutex);
+                taken.swap(filled);
             }
-        });
-    }
+            for (Block const& block : taken) {
+                if (!block.IsIntact()) ++broken;
+                block.Free();
+            }
+            freed += static_cast<int>(taken.size());
+            if (taken.empty()) std::this_thread::yield();
+        }
+        filler.join();
+    };
+    std::vector<std::thread> threads;
+    for (int pair = 0; pair < 3; ++pair) threads.emplace_back(exchange, pair);
     for (std::thread& thread : threads) thread.join();
     EXPECT_EQ(broken, 0);
 }

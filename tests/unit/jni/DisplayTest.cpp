@@ -24,10 +24,9 @@ TEST(Display, TabletsHaveAShorterSideOfAtLeast512) {
         float density;
         bool isTablet;
     } const cases[] = {
-        {1080, 1920, 2.0f, true}, {1080, 1920, 2.25f, false}, {1920, 1080, 2.25f, false},
-        {512, 512, 1.0f, true},   {511, 9999, 1.0f, false},   {1024, 1024, 2.0f, true},
-        {1, 1, 0.0f, true},       {0, 9, 0.0f, false},        {1080, 1080, kNaN, false},
-        {-1, 9, 0.0f, false},     {9999, 9999, -1.0f, false}, {1, 9, -0.0f, false},
+        {1080, 1920, 2.0f, true}, {1920, 1080, 2.25f, false}, {512, 512, 1.0f, true},
+        {511, 9999, 1.0f, false}, {1, 1, 0.0f, true},         {0, 9, 0.0f, false},
+        {-1, 9, 0.0f, false},     {1080, 1080, kNaN, false},  {9999, 9999, -1.0f, false},
     };
     for (auto const& [width, height, density, isTablet] : cases) {
         EXPECT_EQ(MakeDisplay(width, height, density).IsTabletUX(), isTablet)

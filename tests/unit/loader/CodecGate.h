@@ -4,7 +4,7 @@
 
 namespace Moka::Testing {
 
-// While one exists, every decode and encode waits at the gate until it opens. One at a time.
+// While one exists, every decode and encode waits at the gate until it opens. One at a time, on one thread.
 class CodecGate {
 public:
     CodecGate();
@@ -13,8 +13,11 @@ public:
     CodecGate& operator=(CodecGate const&) = delete;
 
     // Until a codec has come to the gate.
-    void AwaitArrival();
+    static void AwaitArrival();
     void Open();
+
+private:
+    bool mIsClosed = true;
 };
 
 // While one exists, every decode and encode throws std::bad_alloc.

@@ -5,58 +5,27 @@
 
 #include <chrono>
 #include <cstdio>
-#include <fstream>
+#include <type_traits>
 
 namespace Moka::Testing {
 namespace {
 
 class FrontEnd : public LoaderFixture {
 protected:
-    // Two threads may call at once only where the test lets them.
-    template <class L>
-    typename L::Callback MakeCallback() {
-        typename L::Callback callback;
-        callback.onLoad = [this](int id, String const&, auto& bitmap) {
-            Note("load " + std::to_string(id) + " " + std::to_string(bitmap.GetWidth()));
-        };
-        callback.onLoadError = [this](int id, String const&) { Note("error " + std::to_string(id)); };
-        callback.onSave = [this](int id, String const&, void*) { Note("save " + std::to_string(id)); };
-        callback.onSaveError = [this](int id, String const&, void*) {
-            Note("save error " + std::to_string(id));
-        };
-        return callback;
-    }
-    void Note(std::string const& event) {
-        std::lock_guard<std::mutex> const lock(mutex);
-        events.push_back(event);
-    }
-    Events GetEvents() {
-        std::lock_guard<std::mutex> const lock(mutex);
-        return events;
-    }
     void AwaitAll() {
         MKBitmapLoader::WaitForAllSaveRequestsToEnd(queue.get());
         MKBitmapLoader::WaitUntilMsgQueueRequired();
     }
 
-    std::mutex mutex;
-    Events events;
-};
-
-template <class Loader>
-struct Traits;
-template <>
-struct Traits<MKBitmapLoader> {
-    static constexpr char const* kName = "MKBitmapLoader";
-};
-template <>
-struct Traits<BitmapLoader> {
-    static constexpr char const* kName = "BitmapLoader";
+    RecordingListener listener;
 };
 
 template <class L>
 class EitherFrontEnd : public FrontEnd {
 protected:
+    static constexpr char const* kName =
+        std::is_same_v<L, MKBitmapLoader> ? "MKBitmapLoader" : "BitmapLoader";
+
     static std::string Format(char const* format, void const* address) {
         char text[64];
         std::snprintf(text, sizeof text, format, address);
@@ -64,7 +33,7 @@ protected:
     }
     // A line of the front end named "pad".
     std::string Line(L const& loader, std::string const& rest) const {
-        return std::string(Traits<L>::kName) + Format("[%p:pad] ", &loader) + rest;
+        return kName + Format("[%p:pad] ", &loader) + rest;
     }
 };
 using FrontEnds = ::testing::Types<MKBitmapLoader, BitmapLoader>;
@@ -72,21 +41,19 @@ TYPED_TEST_SUITE(EitherFrontEnd, FrontEnds);
 
 TYPED_TEST(EitherFrontEnd, LogsAndCallsInBothKindsOfBuild) {
     TestImage const image = MakeGradient(5, 4);
+    String const path = this->WritePicture("a.mki");
+    String const missing = this->Path("missing.mki");
+    String const bad = this->Path("bad.unknown");
     for (bool const eng : {false, true}) {
         System::SetBuildTypeEngMode(eng);
-        this->events.clear();
-        String const path = this->WritePicture("a.mki");
-        String const missing = this->Path("missing.mki");
-        String const bad = this->Path("bad.unknown");
-        auto const show = [&](String const& which, std::string const& before, std::string const& after) {
-            return before + (eng ? which.ToUtf8() + (after.empty() || after[0] == ')' ? "" : ", ") : "") +
-                   after;
+        RecordingListener told;
+        // The path, where the build shows it, between what stands around it.
+        auto const with = [&](std::string const& before, String const& shown, std::string const& after) {
+            return before + (eng ? shown.ToUtf8() : "") + after;
         };
-        auto const id = [&](String const& which, int number) {
-            return std::to_string(number) + (eng ? ", " + which.ToUtf8() : "");
-        };
+        std::string const comma = eng ? ", " : "";
         void const* loaded = nullptr;
-        auto callback = this->template MakeCallback<TypeParam>();
+        auto callback = MakeCallback<TypeParam>(told);
         callback.onLoad = [&](int, String const&, auto& bitmap) { loaded = &bitmap; };
         auto loader = std::make_unique<TypeParam>("pad", &callback);
         this->log.Clear();
@@ -100,33 +67,31 @@ TYPED_TEST(EitherFrontEnd, LogsAndCallsInBothKindsOfBuild) {
         this->AwaitAll();
         loader->CancelLoadRequest(6);
         loader->CancelAllLoadRequest();
-        EXPECT_EQ(this->GetEvents(), (Events{"error 2", "save 3", "save error 5"}));
-        TypeParam const& front = *loader;
-        std::vector<std::string> const expected{
-            this->Line(front, "RequestLoad(" + id(path, 1) + ") ret true"),
-            this->Line(front, "OnLoad(" + id(path, 1) + this->Format(", %p)", loaded)),
-            this->Line(front, "RequestLoad(" + id(missing, 2) + ") ret true"),
-            this->Line(front, "OnLoadError(" + id(missing, 2) + ")"),
-            this->Line(front, show(path, "RequestSave(", this->Format("%p) ret true", pixels))),
-            this->Line(front, eng ? "OnSave(" + path.ToUtf8() + ")" : "OnSave"),
-            this->Line(front, show(path, "RequestSave(", this->Format("%p) ret false", nullptr))),
-            this->Line(front, eng ? "OnSaveError(" + bad.ToUtf8() + ")" : "OnSaveError"),
-            this->Line(front, "CancelLoadRequest(6)"),
-            this->Line(front, "CancelAllLoadRequest()"),
-        };
-        for (std::string const& text : expected) {
-            LogLine const line = this->log.Find(text);
+        EXPECT_EQ(told.GetEvents(), (Events{"error 2", "save 3", "save error 5"}));
+        for (std::string const& text : {
+                 with("RequestLoad(1" + comma, path, ") ret true"),
+                 with("OnLoad(1" + comma, path, this->Format(", %p)", loaded)),
+                 with("RequestLoad(2" + comma, missing, ") ret true"),
+                 with("OnLoadError(2" + comma, missing, ")"),
+                 with("RequestSave(", path, comma + this->Format("%p) ret true", pixels)),
+                 with(eng ? "OnSave(" : "OnSave", path, eng ? ")" : ""),
+                 with("RequestSave(", path, comma + this->Format("%p) ret false", nullptr)),
+                 with(eng ? "OnSaveError(" : "OnSaveError", bad, eng ? ")" : ""),
+                 std::string("CancelLoadRequest(6)"),
+                 std::string("CancelAllLoadRequest()"),
+             }) {
+            LogLine const line = this->log.Find(this->Line(*loader, text));
             EXPECT_EQ(line.priority, ANDROID_LOG_INFO) << text;
-            EXPECT_EQ(line.tag, Traits<TypeParam>::kName) << text;
+            EXPECT_EQ(line.tag, this->kName) << text;
         }
-        std::string const last = this->Line(front, std::string("~") + Traits<TypeParam>::kName);
+        std::string const last = this->Line(*loader, std::string("~") + this->kName);
         loader.reset();
         EXPECT_TRUE(this->log.Has(last));
     }
 }
 
 TYPED_TEST(EitherFrontEnd, ListsAreHandedOn) {
-    auto callback = this->template MakeCallback<TypeParam>();
+    auto callback = MakeCallback<TypeParam>(this->listener);
     std::size_t count = 0;
     callback.onLoadList = [&](int, String const&, auto& bitmaps) { count = bitmaps.size(); };
     TypeParam loader("pad", &callback);
@@ -140,8 +105,8 @@ TYPED_TEST(EitherFrontEnd, ListsAreHandedOn) {
             std::is_same_v<TypeParam, BitmapLoader> ? static_cast<void*>(&cpu) : &graphics;
         EXPECT_TRUE(this->log.Has(this->Line(loader, std::string("OnLoadList(1, ") + (eng ? "p, " : "") +
                                                          this->Format("%p, size3)", list))));
-        EXPECT_EQ(count, 3u);
     }
+    EXPECT_EQ(count, 3u);
     EXPECT_EQ(this->log.Count(ANDROID_LOG_INFO, "OnLoadList"), 2) << "only its own kind";
 }
 
@@ -153,13 +118,13 @@ TYPED_TEST(EitherFrontEnd, WithoutANameOnlyThePairIsLogged) {
         loader.CancelLoadRequest(3);
         this->AwaitAll();
     }
-    EXPECT_EQ(this->LinesOf(Traits<TypeParam>::kName), (Events{"OnCallbackPending", "OnCallbackCompleted",
-                                                               "OnCallbackPending", "OnCallbackCompleted"}));
+    EXPECT_EQ(this->LinesOf(this->kName), (Events{"OnCallbackPending", "OnCallbackCompleted",
+                                                  "OnCallbackPending", "OnCallbackCompleted"}));
 }
 
 TYPED_TEST(EitherFrontEnd, DestroyedWhileDecodingItCallsNobodyAndDoesNotWait) {
     String const path = this->WritePicture("a.mki");
-    auto callback = this->template MakeCallback<TypeParam>();
+    auto callback = MakeCallback<TypeParam>(this->listener);
     CodecGate gate;
     {
         TypeParam loader("pad", &callback);
@@ -169,7 +134,7 @@ TYPED_TEST(EitherFrontEnd, DestroyedWhileDecodingItCallsNobodyAndDoesNotWait) {
     } // returns with the gate still closed
     gate.Open();
     this->AwaitAll();
-    EXPECT_EQ(this->GetEvents(), Events{});
+    EXPECT_EQ(this->listener.GetEvents(), Events{});
 }
 
 TYPED_TEST(EitherFrontEnd, DestroyedWhileCallingItWaitsForTheCall) {
@@ -177,7 +142,7 @@ TYPED_TEST(EitherFrontEnd, DestroyedWhileCallingItWaitsForTheCall) {
     Flag entered;
     Flag mayLeave;
     bool left = false; // not atomic: the destructor is what makes it visible
-    auto callback = this->template MakeCallback<TypeParam>();
+    auto callback = MakeCallback<TypeParam>(this->listener);
     callback.onLoad = [&](int, String const&, auto&) {
         entered.Set();
         mayLeave.Wait();
@@ -189,7 +154,7 @@ TYPED_TEST(EitherFrontEnd, DestroyedWhileCallingItWaitsForTheCall) {
     loader->RequestLoad(1, path, this->queue.get());
     loader->RequestLoad(2, path, this->queue.get());
     entered.Wait();
-    std::string const line = this->Line(*loader, std::string("~") + Traits<TypeParam>::kName);
+    std::string const line = this->Line(*loader, std::string("~") + this->kName);
     std::thread destroyer([&] {
         loader.reset();
         EXPECT_TRUE(left);
@@ -201,11 +166,11 @@ TYPED_TEST(EitherFrontEnd, DestroyedWhileCallingItWaitsForTheCall) {
 
 TYPED_TEST(EitherFrontEnd, ACallbackMayRequestCancelAndDestroyOthers) {
     String const path = this->WritePicture("a.mki");
-    auto callback = this->template MakeCallback<TypeParam>();
+    auto callback = MakeCallback<TypeParam>(this->listener);
     TypeParam loader("pad", &callback);
     auto other = std::make_unique<TypeParam>("other", &callback);
     Flag done;
-    auto busy = this->template MakeCallback<TypeParam>();
+    auto busy = MakeCallback<TypeParam>(this->listener);
     busy.onLoadError = [&](int, String const&) {
         other.reset();
         loader.CancelLoadRequest(1);
@@ -222,13 +187,13 @@ TYPED_TEST(EitherFrontEnd, ACallbackMayRequestCancelAndDestroyOthers) {
     gate.Open();
     done.Wait();
     this->AwaitAll();
-    EXPECT_EQ(this->GetEvents(), Events{"save 3"});
+    EXPECT_EQ(this->listener.GetEvents(), Events{"save 3"});
     loader.WaitForCallback();
 }
 
 TEST_F(FrontEnd, TheTwoKindsShareOneQueueAndOneThread) {
-    auto onGpu = MakeCallback<MKBitmapLoader>();
-    auto onCpu = MakeCallback<BitmapLoader>();
+    auto onGpu = MakeCallback<MKBitmapLoader>(listener);
+    auto onCpu = MakeCallback<BitmapLoader>(listener);
     MKBitmapLoader graphics("graphics", &onGpu);
     BitmapLoader cpu("cpu", &onCpu);
     String const path = WritePicture("a.mki");
@@ -239,20 +204,17 @@ TEST_F(FrontEnd, TheTwoKindsShareOneQueueAndOneThread) {
         cpu.RequestLoad(id + 1, path, queue.get());
     }
     AwaitAll();
-    EXPECT_EQ(GetEvents(), (Events{"load 0 3", "load 1 5", "load 2 3", "load 3 5"}));
+    EXPECT_EQ(listener.GetEvents(), (Events{"load 0 3x3", "load 1 5x4", "load 2 3x3", "load 3 5x4"}));
     int threads = 0;
-    for (auto const& task : std::filesystem::directory_iterator("/proc/self/task")) {
-        std::string name;
-        std::getline(std::ifstream(task.path() / "comm"), name);
-        threads += name == "MokaBitmapLoade";
-    }
+    for (auto const& task : std::filesystem::directory_iterator("/proc/self/task"))
+        threads += ReadBytes(task.path() / "comm") == "MokaBitmapLoade\n";
     EXPECT_EQ(threads, 1);
 }
 
 TEST_F(FrontEnd, BitmapsAreSavedAndTheLoaderFreesACpuBitmapsPixels) {
     TestImage image = MakeAlphaPattern(20, 10);
-    auto onGpu = MakeCallback<MKBitmapLoader>();
-    auto onCpu = MakeCallback<BitmapLoader>();
+    auto onGpu = MakeCallback<MKBitmapLoader>(listener);
+    auto onCpu = MakeCallback<BitmapLoader>(listener);
     MKBitmapLoader graphics("graphics", &onGpu);
     BitmapLoader cpu("cpu", &onCpu);
     {
@@ -267,39 +229,21 @@ TEST_F(FrontEnd, BitmapsAreSavedAndTheLoaderFreesACpuBitmapsPixels) {
     }
     AwaitAll();
     EncodeDirectly(image, Path("direct.png"));
-    EXPECT_EQ(ReadBytes("g.png"), ReadBytes("direct.png"));
-    EXPECT_EQ(ReadBytes("c.png"), ReadBytes("direct.png"));
-    EXPECT_EQ(GetEvents().size(), 2u);
-}
-
-TEST_F(FrontEnd, DestroyedWithSavesInFlightItLeavesTheFiles) {
-    TestImage const image = MakeGradient(20, 10);
-    auto callback = MakeCallback<MKBitmapLoader>();
-    CodecGate gate;
-    {
-        MKBitmapLoader loader("pad", &callback);
-        loader.RequestSave(1, Path("encoding.png"), NewPixels(image), 20, 10, nullptr, 100);
-        gate.AwaitArrival();
-        loader.RequestSave(2, Path("behind.png"), *MakeBitmap(image), nullptr, 100);
-    }
-    gate.Open();
-    AwaitAll();
-    EXPECT_TRUE(Exists("encoding.png"));
-    EXPECT_TRUE(Exists("behind.png"));
-    EXPECT_EQ(GetEvents(), Events{});
+    for (char const* name : {"g.png", "c.png"}) EXPECT_EQ(ReadBytes(name), ReadBytes("direct.png"));
+    EXPECT_EQ(listener.GetEvents().size(), 2u);
 }
 
 TEST_F(FrontEnd, CallbacksAreCopiedAndMayThrow) {
-    auto callback = MakeCallback<BitmapLoader>();
-    callback.onLoadError = [this](int id, String const&) {
-        Note("thrown " + std::to_string(id));
+    auto callback = MakeCallback<BitmapLoader>(listener);
+    callback.onLoadError = [this](int id, String const& path) {
+        listener.OnLoadError(id, path);
         throw id;
     };
     BitmapLoader loader("pad", &callback);
     callback = BitmapLoader::Callback();
     for (int id : {1, 2}) loader.RequestLoad(id, Path("missing.mki"), queue.get());
     AwaitAll();
-    EXPECT_EQ(GetEvents(), (Events{"thrown 1", "thrown 2"}));
+    EXPECT_EQ(listener.GetEvents(), (Events{"error 1", "error 2"}));
     EXPECT_EQ(log.Count(ANDROID_LOG_ERROR, "OnLoadError threw something that is no std::exception"), 2);
     loader.WaitForCallback();
 }

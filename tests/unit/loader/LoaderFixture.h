@@ -13,10 +13,9 @@
 #include "moka/graphics/bitmap/MKGraphicsFactory.h"
 #include "moka/graphics/loader/BitmapLoaderImpl.h"
 #include "moka/graphics/loader/MKBitmapLoader.h"
-#include "moka/host/TaskQueue.h"
-#include "moka/renderer/RendererFactory.h"
 #include "tests/support/LogCapture.h"
 #include "tests/support/RecordingRenderer.h"
+#include "tests/support/RecordingThread.h"
 #include "tests/support/TestImages.h"
 #include "tests/unit/loader/CodecGate.h"
 
@@ -46,34 +45,10 @@ class Flag {
 public:
     void Set() { mPromise.set_value(); }
     void Wait() const { mFuture.wait(); }
-    bool IsSet() const { return mFuture.wait_for(std::chrono::seconds(0)) == std::future_status::ready; }
 
 private:
     std::promise<void> mPromise;
     std::shared_future<void> mFuture{mPromise.get_future()};
-};
-
-class RecordingThread final : public TaskQueue {
-public:
-    explicit RecordingThread(int maxSide) {
-        RecordingRenderer::Reset();
-        RecordingRenderer::SetMaxTextureSize(maxSide);
-        Flag ready;
-        mThread = std::thread([&] {
-            RendererFactory::AttachContext();
-            ready.Set();
-            Run([] {});
-            RendererFactory::DetachContext();
-        });
-        ready.Wait();
-    }
-    ~RecordingThread() override {
-        RequestStop();
-        mThread.join();
-    }
-
-private:
-    std::thread mThread;
 };
 
 class LoaderFixture : public ::testing::Test {
@@ -113,10 +88,6 @@ protected:
         EXPECT_TRUE(EncodeDirectly(image, path));
         return path;
     }
-    String WriteBytes(std::string const& name, std::string const& bytes) const {
-        std::ofstream(folder / name, std::ios::binary) << bytes;
-        return Path(name);
-    }
     std::string ReadBytes(std::string const& name) const {
         std::ifstream file(folder / name, std::ios::binary);
         return {std::istreambuf_iterator<char>(file), {}};
@@ -133,9 +104,9 @@ protected:
         std::copy(image.pixels.begin(), image.pixels.end(), pixels);
         return pixels;
     }
-    RefPtr<IMKBitmap> MakeBitmap(TestImage const& image, IGLMsgQueue* on = nullptr) const {
+    RefPtr<IMKBitmap> MakeBitmap(TestImage const& image) const {
         return RefPtr<IMKBitmap>::Adopt(MKGraphicsFactory::CreateBitmap(
-            on ? on : queue.get(), image.width, image.height, NewPixels(image), true, 1, false));
+            queue.get(), image.width, image.height, NewPixels(image), true, 1, false));
     }
 
     void AwaitLine(std::string const& text) const {
@@ -152,7 +123,6 @@ protected:
         };
         while (!isIdle()) std::this_thread::yield();
     }
-    // Without numbers and addresses; for comparing with the text that is promised.
     std::vector<std::string> LinesOf(std::string const& tag) const {
         std::vector<std::string> texts;
         for (LogLine const& line : log.GetLines())
@@ -172,20 +142,21 @@ public:
     void OnLoad(int id, String const&, Bitmap& bitmap) override { Loaded(id, bitmap, &bitmap, nullptr); }
     void OnLoad(int id, String const&, IMKBitmap& bitmap) override { Loaded(id, bitmap, nullptr, &bitmap); }
     void OnLoadError(int id, String const&) override { Note("error " + std::to_string(id)); }
-    void OnSave(int id, String const&, void* data) override {
-        userData = data;
-        Note("save " + std::to_string(id));
-    }
-    void OnSaveError(int id, String const&, void* data) override {
-        userData = data;
-        Note("save error " + std::to_string(id));
-    }
+    void OnSave(int id, String const&, void* data) override { Saved("save ", id, data); }
+    void OnSaveError(int id, String const&, void* data) override { Saved("save error ", id, data); }
     void OnCallbackPending() override { Note("pending"); }
     void OnCallbackCompleted() override { Note("completed"); }
 
     std::vector<std::string> GetEvents() const {
         std::lock_guard<std::mutex> const lock(mMutex);
         return mEvents;
+    }
+    // What became of one request after the other: the event between "pending" and "completed".
+    std::vector<std::string> GetResults() const {
+        std::vector<std::string> results = GetEvents();
+        auto const isFrame = [](std::string const& e) { return e == "pending" || e == "completed"; };
+        results.erase(std::remove_if(results.begin(), results.end(), isFrame), results.end());
+        return results;
     }
     // Until this many requests have been completed.
     void AwaitCompleted(int count) const {
@@ -206,6 +177,10 @@ private:
         Note("load " + std::to_string(id) + " " + std::to_string(result.GetWidth()) + "x" +
              std::to_string(result.GetHeight()));
     }
+    void Saved(char const* what, int id, void* data) {
+        userData = data;
+        Note(what + std::to_string(id));
+    }
     // The listener may be gone as soon as the event is seen.
     void Note(std::string const& event) {
         auto const hook = whenNoted;
@@ -221,6 +196,19 @@ private:
     std::condition_variable mutable mChanged;
     std::vector<std::string> mEvents;
 };
+
+// The callbacks of a front end of either kind, which tell the listener.
+template <class FrontEnd>
+typename FrontEnd::Callback MakeCallback(RecordingListener& listener) {
+    typename FrontEnd::Callback callback;
+    callback.onLoad = [&](int id, String const& path, auto& bitmap) { listener.OnLoad(id, path, bitmap); };
+    callback.onLoadError = [&](int id, String const& path) { listener.OnLoadError(id, path); };
+    callback.onSave = [&](int id, String const& path, void* data) { listener.OnSave(id, path, data); };
+    callback.onSaveError = [&](int id, String const& path, void* data) {
+        listener.OnSaveError(id, path, data);
+    };
+    return callback;
+}
 
 using Events = std::vector<std::string>;
 

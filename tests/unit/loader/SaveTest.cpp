@@ -38,10 +38,6 @@ protected:
         EXPECT_TRUE(EncodeDirectly(image, Path("direct." + extension), quality));
         return ReadBytes("direct." + extension);
     }
-    void AwaitWaiters(int count) {
-        while (log.Count(ANDROID_LOG_INFO, "SaveTaskRunning -> Start Wait") < count)
-            std::this_thread::yield();
-    }
 
     TestImage image = MakeAlphaPattern(40, 30);
     RecordingListener listener;
@@ -56,25 +52,18 @@ TEST_F(Save, EveryFormatIsWrittenAsTheEncoderWouldAndUserDataComesBack) {
         EXPECT_EQ(listener.userData, &count);
         ++count;
     }
-    EXPECT_EQ(listener.GetEvents(),
-              (Events{"pending", "save 0", "completed", "pending", "save 1", "completed", "pending", "save 2",
-                      "completed", "pending", "save 3", "completed"}));
+    EXPECT_EQ(listener.GetResults(), (Events{"save 0", "save 1", "save 2", "save 3"}));
+    EXPECT_EQ(listener.GetEvents().size(), 3 * 4u);
 }
 
 TEST_F(Save, WhatCannotBeWrittenIsAnErrorAndTheLoopGoesOn) {
-    std::filesystem::create_directories(folder / "folder.png");
-    std::vector<std::string> const names{"s.unknown", "s", "no folder/s.png", "folder.png",
-                                         std::string(700, 'x') + ".png"};
     int count = 0;
-    for (std::string const& name : names) EXPECT_TRUE(Request(count++, name));
-    struct Size {
-        int width;
-        int height;
-    };
+    for (char const* name : {"s.unknown", "no folder/s.png"}) EXPECT_TRUE(Request(count++, name));
     constexpr int kHuge = std::numeric_limits<int>::max();
-    for (Size const size : {Size{0, 30}, Size{40, -1}, Size{kHuge, 1}, Size{kHuge, kHuge}}) {
-        EXPECT_TRUE(Loader().RequestSave(&listener, count++, Path("s.png"), NewPixels(image), size.width,
-                                         size.height, nullptr, 100));
+    std::pair<int, int> const sizes[] = {{0, 30}, {40, -1}, {kHuge, 1}, {kHuge, kHuge}};
+    for (auto const& [width, height] : sizes) {
+        EXPECT_TRUE(Loader().RequestSave(&listener, count++, Path("s.png"), NewPixels(image), width, height,
+                                         nullptr, 100));
     }
     {
         listener.AwaitCompleted(count);
@@ -82,32 +71,27 @@ TEST_F(Save, WhatCannotBeWrittenIsAnErrorAndTheLoopGoesOn) {
         EXPECT_TRUE(Request(count++, "s.png"));
         listener.AwaitCompleted(count);
     }
-    for (int i = 0; i < count; ++i)
-        EXPECT_EQ(listener.GetEvents()[static_cast<std::size_t>(i) * 3 + 1],
-                  "save error " + std::to_string(i));
-    EXPECT_EQ(log.Count(ANDROID_LOG_INFO, "BitmapLoaderImpl::SaveBitmap error bitmap construct fail"), 4);
     EXPECT_FALSE(Exists("s.png"));
+    Events expected;
+    for (int i = 0; i < count; ++i) expected.push_back("save error " + std::to_string(i));
+    expected.push_back("save " + std::to_string(count));
     EXPECT_TRUE(Request(count, "s.png"));
     listener.AwaitCompleted(count + 1);
-    EXPECT_EQ(listener.GetEvents().end()[-2], "save " + std::to_string(count));
+    EXPECT_EQ(listener.GetResults(), expected);
+    EXPECT_EQ(log.Count(ANDROID_LOG_INFO, "BitmapLoaderImpl::SaveBitmap error bitmap construct fail"), 4);
 }
 
-TEST_F(Save, WithoutAListenerTheFileIsWritten) {
+TEST_F(Save, WithoutAListenerTheFileIsWrittenAndWithoutPixelsItIsRefused) {
     EXPECT_TRUE(Loader().RequestSave(nullptr, 1, Path("s.png"), NewPixels(image), 40, 30, nullptr, 100));
     EXPECT_FALSE(Loader().RequestSave(&listener, 1, Path("s.png"), nullptr, 40, 30, nullptr, 100));
+    HeldBitmap noWidth(0, 5);
+    HeldBitmap noHeight(5, 0);
+    EXPECT_FALSE(Loader().RequestSave(&listener, 1, Path("s.png"), noWidth, nullptr, 100));
+    EXPECT_FALSE(Loader().RequestSave(&listener, 1, Path("s.png"), noHeight, nullptr, 100));
     Loader().WaitForAllSaveRequestsToEnd();
     EXPECT_EQ(ReadBytes("s.png"), EncodedDirectly("png"));
     EXPECT_EQ(
         log.Count(ANDROID_LOG_INFO, "BitmapLoaderImpl::SaveBitmap queue size(0). callback for request["), 1);
-}
-
-TEST_F(Save, ATallBitmapIsReadBackAndWrittenWhole) {
-    image = MakeGradient(9, 2 * kMaxSide + 5);
-    auto bitmap = MakeBitmap(image);
-    EXPECT_TRUE(Loader().RequestSave(&listener, 1, Path("s.png"), *bitmap, nullptr, 100));
-    bitmap = {}; // the read-back does without the caller's reference
-    MKBitmapLoader::WaitForAllSaveRequestsToEnd(queue.get());
-    EXPECT_EQ(ReadBytes("s.png"), EncodedDirectly("png"));
 }
 
 TEST_F(Save, WhatABitmapDoesNotCoverIsTransparent) {
@@ -122,15 +106,6 @@ TEST_F(Save, WhatABitmapDoesNotCoverIsTransparent) {
     EXPECT_EQ(ReadBytes("s.png"), EncodedDirectly("png"));
 }
 
-TEST_F(Save, AnEmptyBitmapIsRefused) {
-    HeldBitmap noWidth(0, 5);
-    HeldBitmap noHeight(5, 0);
-    EXPECT_FALSE(Loader().RequestSave(&listener, 1, Path("s.png"), noWidth, nullptr, 100));
-    EXPECT_FALSE(Loader().RequestSave(&listener, 2, Path("s.png"), noHeight, nullptr, 100));
-    Loader().WaitForAllSaveRequestsToEnd();
-    EXPECT_EQ(listener.GetEvents(), Events{});
-}
-
 TEST_F(Save, WaitersWaitForTheReadBackAndTheFile) {
     image = TestImage(4, 3);
     std::fill(image.pixels.begin(), image.pixels.end(), static_cast<unsigned char>(0xFF));
@@ -143,7 +118,7 @@ TEST_F(Save, WaitersWaitForTheReadBackAndTheFile) {
             EXPECT_TRUE(Exists("s.png"));
             EXPECT_EQ(listener.GetEvents().size(), 3u);
         });
-    AwaitWaiters(3);
+    while (log.Count(ANDROID_LOG_INFO, "SaveTaskRunning -> Start Wait") < 3) std::this_thread::yield();
     EXPECT_TRUE(log.Has("WaitForAllSaveRequestsToEnd - SaveTaskRunning -> Start Wait, "
                         "mPendingSaveRequestList->GetCount() = 1, mQueue->GetCount() = 0, "
                         "mSaveTaskRunning = 0"));
@@ -180,25 +155,21 @@ TEST_F(Save, ALoadQueuedBehindASaveReadsWhatItWrote) {
     Request(1, "s.mki");
     Loader().RequestLoad(&listener, 2, Path("s.mki"), detail::BITMAP_TYPE_CPU, queue.get(), 0, 0);
     listener.AwaitCompleted(2);
-    EXPECT_EQ(listener.GetEvents()[4], "load 2 40x30");
+    EXPECT_EQ(listener.GetResults(), (Events{"save 1", "load 2 40x30"}));
 }
 
 TEST_F(Save, ARequestThatMemoryRunsOutForIsRefusedAndLeavesThePixels) {
     String const path = Path("s.png");
     HeldBitmap bitmap(4, 3);
     auto* const pixels = NewPixels(image);
-    bool saves = true;
-    bool savesBitmap = true;
-    bool loads = true;
+    int accepted = 0;
     {
         FailAllocations const fail;
-        saves = Loader().RequestSave(&listener, 1, path, pixels, 40, 30, nullptr, 100);
-        savesBitmap = Loader().RequestSave(&listener, 1, path, bitmap, nullptr, 100);
-        loads = Loader().RequestLoad(&listener, 1, path, detail::BITMAP_TYPE_CPU, nullptr, 0, 0);
+        accepted += Loader().RequestSave(&listener, 1, path, pixels, 40, 30, nullptr, 100);
+        accepted += Loader().RequestSave(&listener, 1, path, bitmap, nullptr, 100);
+        accepted += Loader().RequestLoad(&listener, 1, path, detail::BITMAP_TYPE_CPU, nullptr, 0, 0);
     }
-    EXPECT_FALSE(saves);
-    EXPECT_FALSE(savesBitmap);
-    EXPECT_FALSE(loads);
+    EXPECT_EQ(accepted, 0);
     delete[] pixels;
     Loader().WaitForAllSaveRequestsToEnd();
     EXPECT_EQ(listener.GetEvents(), Events{});

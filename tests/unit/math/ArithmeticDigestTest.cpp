@@ -10,6 +10,7 @@
 #include <cstdint>
 #include <cstring>
 #include <gtest/gtest.h>
+#include <limits>
 
 namespace Moka::Testing {
 namespace {
@@ -18,14 +19,11 @@ constexpr int kRounds = 20000;
 
 class Digest {
 public:
-    void Add(float value) {
-        std::uint32_t bits = 0x7fc00000;
-        if (!std::isnan(value)) std::memcpy(&bits, &value, sizeof bits);
-        AddBits(bits);
-    }
-    void Add(double value) {
-        std::uint64_t bits = 0x7ff8000000000000;
-        if (!std::isnan(value)) std::memcpy(&bits, &value, sizeof bits);
+    template <class Float>
+    void Add(Float value) {
+        if (std::isnan(value)) value = std::numeric_limits<Float>::quiet_NaN();
+        std::uint64_t bits = 0;
+        std::memcpy(&bits, &value, sizeof value);
         AddBits(bits);
     }
     void Add(RectF const& r) {

@@ -7,7 +7,6 @@
 #include <cstdint>
 #include <cstring>
 #include <random>
-#include <utility>
 #include <vector>
 
 namespace Moka::Testing {
@@ -28,6 +27,12 @@ class Sample {
 public:
     explicit Sample(unsigned seed) : mGenerator(seed) {}
     float Next() { return static_cast<float>(static_cast<int>(mGenerator() % 20001) - 10000) / 1000.0f; }
+    template <class Matrix>
+    Matrix NextMatrix() {
+        Matrix m;
+        for (int i = 0; i < m.storageSize() / 4; ++i) m[i] = Next();
+        return m;
+    }
 
 private:
     std::mt19937 mGenerator;
@@ -56,29 +61,6 @@ struct Reference {
         return result;
     }
 
-    // By elimination with pivoting, which has nothing in common with cofactors.
-    double Determinant() const {
-        Reference m = *this;
-        double determinant = 1;
-        for (int i = 0; i < N; ++i) {
-            int pivot = i;
-            for (int row = i + 1; row < N; ++row) {
-                if (std::abs(m.at[row][i]) > std::abs(m.at[pivot][i])) pivot = row;
-            }
-            if (m.at[pivot][i] == 0) return 0;
-            if (pivot != i) {
-                std::swap(m.at[pivot], m.at[i]);
-                determinant = -determinant;
-            }
-            determinant *= m.at[i][i];
-            for (int row = i + 1; row < N; ++row) {
-                double const factor = m.at[row][i] / m.at[i][i];
-                for (int column = i; column < N; ++column) m.at[row][column] -= factor * m.at[i][column];
-            }
-        }
-        return determinant;
-    }
-
     // The largest difference of an element, relative where the elements are large.
     template <class Matrix>
     double Distance(Matrix const& m) const {
@@ -91,11 +73,6 @@ struct Reference {
             }
         }
         return largest;
-    }
-
-    std::pair<double, double> MapPoint(double x, double y) const {
-        double const w = at[2][0] * x + at[2][1] * y + at[2][2];
-        return {(at[0][0] * x + at[0][1] * y + at[0][2]) / w, (at[1][0] * x + at[1][1] * y + at[1][2]) / w};
     }
 };
 

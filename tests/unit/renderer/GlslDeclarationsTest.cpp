@@ -36,7 +36,7 @@ uniform Block { vec4 inside; } block;
 TEST(GlslDeclarationsTest, WordsInCommentsBodiesAndParametersAreNoDeclarations) {
     char const* const source = R"(
 // attribute vec4 commented;
-/* uniform vec4 gone; /*/ attribute vec3 first;
+/*/ uniform vec4 gone; /*/ attribute vec3 first;
 float f(in vec4 parameter, const in float other) { vec4 attribute_; { int in_; } return 1.0; }
 uniform float after; // uniform
 attribute vec2 last; /* never closed; attribute vec2 swallowed;)";

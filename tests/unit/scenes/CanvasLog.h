@@ -128,6 +128,13 @@ private:
     int mLevel = 0;
 };
 
+// A stage with no room for bitmaps, and no GPU.
+class EmptyStage final : public Scenes::SceneStage {
+public:
+    IMKBitmap* MakeBitmap(Scenes::Picture const&) override { return nullptr; }
+    IGLMsgQueue* GetQueue() override { return nullptr; }
+};
+
 // Draws the scene on one, with bitmaps of the library's own.
 RefPtr<CanvasLog> PlayScene(Scenes::Scene const& scene);
 

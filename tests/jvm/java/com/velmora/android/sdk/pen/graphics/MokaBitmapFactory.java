@@ -8,14 +8,12 @@ public final class MokaBitmapFactory {
     public static boolean isThrowing;
     public static String path;
     public static String size;
-    public static String thread;
 
     private MokaBitmapFactory() {}
 
     public static Bitmap decodeFile(String path, int width, int height) {
         MokaBitmapFactory.path = path;
         size = width + "x" + height;
-        thread = Thread.currentThread().getName();
         if (isThrowing) throw new OutOfMemoryError("told to");
         return result;
     }

@@ -1,0 +1,140 @@
+#include "moka/base/codec/RowScaler.h"
+#include "tests/unit/codec/CodecTestSupport.h"
+
+#include <algorithm>
+#include <cmath>
+#include <gtest/gtest.h>
+#include <random>
+#include <utility>
+
+namespace Moka::Testing {
+namespace {
+
+using detail::PixelSize;
+
+// The weight of source pixel i in target pixel j along one axis, straight from the definitions.
+double ReferenceWeight(int from, int to, int i, int j) {
+    double const scale = static_cast<double>(from) / to;
+    if (to <= from) {
+        double const overlap = std::min<double>(i + 1, (j + 1) * scale) - std::max<double>(i, j * scale);
+        return std::max(overlap, 0.0) / scale;
+    }
+    double const centre = std::clamp((j + 0.5) * scale - 0.5, 0.0, from - 1.0);
+    return std::max(0.0, 1 - std::abs(centre - i));
+}
+
+double ReferenceChannel(Image const& source, int width, int height, int x, int y, int channel) {
+    double sum = 0;
+    for (int v = 0; v < source.height; ++v) {
+        double const down = ReferenceWeight(source.height, height, v, y);
+        for (int u = 0; down > 0 && u < source.width; ++u)
+            sum += down * ReferenceWeight(source.width, width, u, x) * source.Row(v)[u * 4 + channel];
+    }
+    return sum;
+}
+
+TEST(RowScaler, IsTheRoundedReferenceForEveryMixOfShrinkingAndGrowing) {
+    std::mt19937 random(7);
+    for (int round = 0; round < 300; ++round) {
+        auto const side = [&random] { return 1 + static_cast<int>(random() % 24); };
+        Image const source = MakeTranslucentNoise(side(), side(), static_cast<unsigned>(round));
+        int const width = side();
+        int const height = round % 50 == 0 ? source.height : side();
+        Image const scaled = Scale(source, width, height);
+        for (int i = 0; i < width * height * 4; ++i) {
+            unsigned char const* const pixel = &scaled.pixels[static_cast<std::size_t>(i / 4 * 4)];
+            double const exact = ReferenceChannel(source, width, height, i / 4 % width, i / 4 / width, i % 4);
+            ASSERT_LE(std::abs(pixel[i % 4] - exact), 0.5 + 1e-9)
+                << source.width << " x " << source.height << " to " << width << " x " << height;
+            ASSERT_LE(pixel[i % 4], pixel[3]) << "a colour above its alpha";
+        }
+    }
+}
+
+TEST(RowScaler, TheLongestSidesOverflowNothing) {
+    constexpr int kLong = 65535;
+    struct {
+        PixelSize from, to;
+    } const cases[] = {{{kLong, 1}, {1, 3}},
+                       {{kLong, 1}, {2, 3}},
+                       {{kLong, 1}, {kLong - 1, 3}},
+                       {{1, kLong}, {1, 1}},
+                       {{2, 2}, {kLong, 3}}};
+    for (auto const& [from, to] : cases) {
+        Image white = MakeImage(from.width, from.height);
+        std::fill(white.pixels.begin(), white.pixels.end(), static_cast<unsigned char>(255));
+        Bytes const scaled = Scale(white, to.width, to.height).pixels;
+        EXPECT_TRUE(std::all_of(scaled.begin(), scaled.end(), [](int byte) { return byte == 255; }));
+    }
+}
+
+TEST(RowScaler, ShrinksWithinTheMemoryOfItsSource) {
+    Image const source = MakeTranslucentNoise(20, 13);
+    for (PixelSize const to :
+         {PixelSize{20, 13}, PixelSize{19, 12}, PixelSize{20, 12}, PixelSize{3, 13}, PixelSize{7, 5}}) {
+        Bytes memory = source.pixels;
+        detail::RowScaler scaler({20, 13}, to, memory.data());
+        for (int y = 0; y < 13; ++y) scaler.Push(memory.data() + y * 80);
+        Bytes const expected = Scale(source, to.width, to.height).pixels;
+        memory.resize(expected.size());
+        EXPECT_EQ(memory, expected) << to.width << " x " << to.height;
+    }
+}
+
+constexpr std::pair<int, int> kSizes[] = {{200, 150}, {199, 149}, {100, 75}, {101, 3},  {26, 19},  {25, 19},
+                                          {1, 1},     {400, 300}, {50, 300}, {400, 20}, {201, 150}};
+
+// Formats without a scaler of their own give exactly what ours gives. A scaled JPEG covers whole blocks, 152
+// rows here instead of 150, which shifts the far edge by a part of a pixel.
+TEST(ScaledDecode, EveryFormatHasTheExactSizeAndTheScalersPixelsOrClose) {
+    TempFolder const folder;
+    Image const noise = MakeTranslucentNoise(200, 150);
+    Image const smooth = MakeGradient(200, 150, true);
+    struct {
+        char const* extension;
+        Image const& image;
+        int tolerance;
+    } const cases[] = {{"png", noise, 0}, {"mki", noise, 0}, {"jpg", smooth, 8}, {"webp", smooth, 2}};
+    for (auto const& [extension, image, tolerance] : cases) {
+        std::string const path = SaveIn(folder, image, extension);
+        for (auto const& [width, height] : kSizes) {
+            EXPECT_LE(LargestDifference(DecodeScaled(path, width, height), Scale(image, width, height)),
+                      tolerance)
+                << extension << ' ' << width << " x " << height;
+        }
+    }
+}
+
+TEST(ScaledDecode, TransparentColourDoesNotBleedIntoWhatRemains) {
+    // Red ink on nothing: whatever it is scaled to, it stays pure red under its alpha.
+    Image ink = MakeImage(64, 64);
+    for (std::size_t i = 0; i < ink.pixels.size(); i += 4 * 3) ink.pixels[i] = ink.pixels[i + 3] = 255;
+    TempFolder const folder;
+    for (char const* extension : {"png", "mki", "webp"}) {
+        std::string const path = SaveIn(folder, ink, extension);
+        for (int side : {7, 32, 100}) {
+            Image const scaled = DecodeScaled(path, side, side);
+            ASSERT_EQ(scaled.width, side);
+            for (std::size_t i = 0; i < scaled.pixels.size(); i += 4) {
+                ASSERT_EQ(scaled.pixels[i], scaled.pixels[i + 3]) << extension << ' ' << side;
+                ASSERT_EQ(scaled.pixels[i + 1], 0) << extension << ' ' << side;
+            }
+        }
+    }
+}
+
+TEST(ScaledDecode, RefusesSizesOutsideTheLimits) {
+    ErrorLines errors;
+    TempFolder const folder;
+    std::string const path = folder.Path("image.png");
+    ASSERT_TRUE(Save(MakeOpaqueNoise(4, 4), path, 100));
+    constexpr int kBad[][2] = {{0, 5}, {5, 0}, {-1, 5}, {65536, 1}, {1, 65536}, {20000, 20000}};
+    for (auto const& size : kBad) {
+        EXPECT_TRUE(DecodeScaled(path, size[0], size[1]).pixels.empty());
+        EXPECT_EQ(errors.Take().size(), 1u) << size[0] << " x " << size[1];
+    }
+    EXPECT_EQ(DecodeScaled(path, 65535, 1).width, 65535);
+}
+
+} // namespace
+} // namespace Moka::Testing
