@@ -5,7 +5,6 @@
 #include "tests/support/ImageCompare.h"
 
 #include <algorithm>
-#include <cstdlib>
 #include <cstring>
 #include <fstream>
 #include <iterator>
@@ -20,19 +19,8 @@ ProcessOptions WithoutDriver() {
     return options;
 }
 
-ToolTest::ToolTest() {
-    std::string name = (fs::temp_directory_path() / "moka-tool-XXXXXX").string();
-    mFolder = mkdtemp(name.data());
-}
-
-ToolTest::~ToolTest() { fs::remove_all(mFolder); }
-
 void ToolTest::Save(TestImage const& image, std::string const& name, int quality) const {
-    Bitmap bitmap;
-    bitmap.Construct(const_cast<unsigned char*>(image.pixels.data()), image.width, image.height,
-                     image.GetStride(), Bitmap::kFormatRgba8888, false, false);
-    String const path(Path(name));
-    ASSERT_TRUE(BitmapFactory::SaveBitmap(&bitmap, &path, quality));
+    ASSERT_TRUE(SaveImage(image, Path(name), quality));
 }
 
 void ToolTest::WriteFile(std::string const& name, std::string const& content) const {

@@ -3,7 +3,7 @@
 
 #include "moka/base/Bitmap.h"
 #include "tests/app/MokaProcess.h"
-#include "tests/support/TestImages.h"
+#include "tests/support/TestFiles.h"
 
 #include <filesystem>
 #include <gmock/gmock.h>
@@ -22,9 +22,6 @@ ProcessOptions WithoutDriver();
 
 class ToolTest : public ::testing::Test {
 protected:
-    ToolTest();
-    ~ToolTest() override;
-
     // Names are relative to the test's folder throughout.
     std::string Path(std::string const& name) const { return (mFolder / name).string(); }
     void Save(TestImage const& image, std::string const& name, int quality = 100) const;
@@ -45,7 +42,11 @@ protected:
                      std::vector<std::string> const& parts, ProcessOptions const& options = {}) const;
     void ExpectSamePixels(TestImage const& image, std::string const& name) const;
 
-    std::filesystem::path mFolder;
+private:
+    TempFolder mTemporary;
+
+protected:
+    std::filesystem::path const& mFolder = mTemporary.GetPath();
 };
 
 } // namespace Moka::Testing

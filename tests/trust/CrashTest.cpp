@@ -2,7 +2,7 @@
 #include "moka/base/Bitmap.h"
 #include "moka/base/BitmapFactory.h"
 #include "moka/base/String.h"
-#include "tests/support/TestImages.h"
+#include "tests/support/TestFiles.h"
 
 #include <atomic>
 #include <chrono>
@@ -32,30 +32,21 @@ struct Shared {
 class CrashTest : public ::testing::Test {
 protected:
     void SetUp() override {
-        std::filesystem::create_directories(folder);
         void* const memory =
             mmap(nullptr, sizeof(Shared), PROT_READ | PROT_WRITE, MAP_SHARED | MAP_ANONYMOUS, -1, 0);
         ASSERT_NE(memory, MAP_FAILED);
         shared = new (memory) Shared;
     }
-    void TearDown() override {
-        munmap(shared, sizeof(Shared));
-        std::filesystem::remove_all(folder);
-    }
+    void TearDown() override { munmap(shared, sizeof(Shared)); }
 
-    String Path(int i) const { return String((folder / "picture.").string() + kExtensions[i % 4]); }
+    std::string Path(int i) const { return folder.Path(std::string("picture.") + kExtensions[i % 4]); }
 
     // Saves one picture over the other until it is killed.
     [[noreturn]] void SaveForEver() {
-        TestImage images[] = {MakeGradient(120, 80), MakeChecker(200, 150, 7, {9, 9, 9, 9}, {0, 0, 0, 255})};
+        TestImage const images[] = {MakeGradient(120, 80),
+                                    MakeChecker(200, 150, 7, {9, 9, 9, 9}, {0, 0, 0, 255})};
         for (int i = 0;; ++i) {
-            TestImage& image = images[i / 4 % 2];
-            Bitmap bitmap;
-            String const path = Path(i);
-            if (!bitmap.Construct(image.pixels.data(), image.width, image.height, image.GetStride(), 1, false,
-                                  false) ||
-                !BitmapFactory::SaveBitmap(&bitmap, &path, 90))
-                shared->failed = true;
+            if (!SaveImage(images[i / 4 % 2], Path(i), 90)) shared->failed = true;
             ++shared->saves;
         }
     }
@@ -75,10 +66,10 @@ protected:
     int ExpectWholePictures() const {
         int found = 0;
         for (int i = 0; i < 4; ++i) {
-            String const path = Path(i);
-            if (!std::filesystem::exists(path.ToUtf8())) continue;
+            String const path(Path(i));
+            if (!std::filesystem::exists(Path(i))) continue;
             std::unique_ptr<Bitmap> const bitmap(BitmapFactory::CreateBitmapForGraphics(&path));
-            EXPECT_TRUE(bitmap) << path.ToUtf8();
+            EXPECT_TRUE(bitmap) << Path(i);
             if (!bitmap) continue;
             EXPECT_TRUE((bitmap->GetWidth() == 120 && bitmap->GetHeight() == 80) ||
                         (bitmap->GetWidth() == 200 && bitmap->GetHeight() == 150));
@@ -88,13 +79,12 @@ protected:
     }
     int CountTemporaries() const {
         int count = 0;
-        for (auto const& entry : std::filesystem::directory_iterator(folder))
+        for (auto const& entry : std::filesystem::directory_iterator(folder.GetPath()))
             if (entry.path().extension() == ".tmp") ++count;
         return count;
     }
 
-    std::filesystem::path const folder =
-        std::filesystem::temp_directory_path() / ("moka_crash_" + std::to_string(getpid()));
+    TempFolder const folder;
     Shared* shared = nullptr;
 };
 
@@ -107,7 +97,7 @@ TEST_F(CrashTest, KillingAThousandSavesLeavesOnlyWholePictures) {
         ++kills;
         ExpectWholePictures();
         interrupted += CountTemporaries();
-        for (auto const& entry : std::filesystem::directory_iterator(folder))
+        for (auto const& entry : std::filesystem::directory_iterator(folder.GetPath()))
             if (entry.path().extension() == ".tmp") std::filesystem::remove(entry.path());
     }
     EXPECT_EQ(ExpectWholePictures(), 4);

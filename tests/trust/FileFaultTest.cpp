@@ -6,18 +6,16 @@
 #include "moka/base/String.h"
 #include "moka/base/log/AndroidLog.h"
 #include "tests/support/LogCapture.h"
-#include "tests/support/TestImages.h"
+#include "tests/support/TestFiles.h"
 
 #include <cerrno>
 #include <csignal>
-#include <filesystem>
 #include <fstream>
 #include <gtest/gtest.h>
 #include <iterator>
 #include <memory>
 #include <string>
 #include <sys/resource.h>
-#include <unistd.h>
 #include <vector>
 
 namespace Moka::Testing {
@@ -29,24 +27,10 @@ constexpr int kErrors[] = {ENOSPC, EACCES, EIO};
 
 class FileFault : public ::testing::TestWithParam<char const*> {
 protected:
-    void SetUp() override {
-        mFolder = std::filesystem::temp_directory_path() / ("moka_files_" + std::to_string(getpid()));
-        std::filesystem::create_directories(mFolder);
-        mPath = mFolder / (std::string("picture.") + GetParam());
-    }
-    void TearDown() override { std::filesystem::remove_all(mFolder); }
-
-    bool Save(TestImage const& image) const {
-        Bitmap bitmap;
-        String const path(mPath.string());
-        std::vector<unsigned char> pixels = image.pixels;
-        return bitmap.Construct(pixels.data(), image.width, image.height, image.GetStride(), 1, false,
-                                false) &&
-               BitmapFactory::SaveBitmap(&bitmap, &path, 90);
-    }
+    bool Save(TestImage const& image) const { return SaveImage(image, mPath, 90); }
     // Its pixels; nothing when it does not load.
     std::vector<unsigned char> Load() const {
-        String const path(mPath.string());
+        String const path(mPath);
         std::unique_ptr<Bitmap> const bitmap(BitmapFactory::CreateBitmapForGraphics(&path));
         if (!bitmap) return {};
         auto const size = static_cast<std::ptrdiff_t>(bitmap->GetStride()) * bitmap->GetHeight();
@@ -57,10 +41,7 @@ protected:
         return {std::istreambuf_iterator<char>(file), {}};
     }
     // The picture, and no temporary file beside it.
-    bool IsAlone() const {
-        auto const files = std::filesystem::directory_iterator(mFolder);
-        return std::distance(begin(files), end(files)) == 1;
-    }
+    bool IsAlone() const { return mFolder.List().size() == 1; }
     template <class Action>
     static int Disturb(Mode mode, int k, int error, Action const& action) {
         FileFaults::Arm(mode, k, error);
@@ -94,8 +75,8 @@ protected:
     LogCapture mLog;
 
 private:
-    std::filesystem::path mFolder;
-    std::filesystem::path mPath;
+    TempFolder const mFolder;
+    std::string const mPath = mFolder.Path(std::string("picture.") + GetParam());
 };
 
 TEST_P(FileFault, ASaveShowsTheOldFileOrTheWholeNewOne) {

@@ -1,7 +1,5 @@
 // The loader over a queue that refuses at random: every accepted request calls back once, but for the saves
 // whose read-back was refused, which never do.
-#include "moka/base/Bitmap.h"
-#include "moka/base/BitmapFactory.h"
 #include "moka/base/RefPtr.h"
 #include "moka/base/String.h"
 #include "moka/graphics/bitmap/IMKBitmap.h"
@@ -12,16 +10,14 @@
 #include "moka/renderer/RendererFactory.h"
 #include "tests/support/LogCapture.h"
 #include "tests/support/RecordingRenderer.h"
-#include "tests/support/TestImages.h"
+#include "tests/support/TestFiles.h"
 #include "tests/trust/Faults.h"
 #include "tests/trust/LeakLedger.h"
 
 #include <algorithm>
 #include <atomic>
-#include <filesystem>
 #include <gtest/gtest.h>
 #include <thread>
-#include <unistd.h>
 #include <vector>
 
 namespace Moka::Testing {
@@ -55,7 +51,6 @@ class RefusingLoaderTest : public ::testing::TestWithParam<int> {
 protected:
     void SetUp() override {
         MKBitmapFactory_UseNativeDecoder();
-        std::filesystem::create_directories(folder);
         RecordingRenderer::Reset();
         RecordingRenderer::KeepRecords(false);
         ASSERT_TRUE(RendererFactory::AttachContext());
@@ -67,10 +62,9 @@ protected:
     void TearDown() override {
         RecordingRenderer::DeclareRenderThread();
         RendererFactory::DetachContext();
-        std::filesystem::remove_all(folder);
     }
 
-    String Path(char const* name) const { return String((folder / name).string()); }
+    String Path(char const* name) const { return String(folder.Path(name)); }
     RefPtr<IMKBitmap> MakeBitmap() {
         return RefPtr<IMKBitmap>::Adopt(
             MKGraphicsFactory::CreateBitmap(&queue, kWidth, kHeight, image.pixels.data(), false, 1, false));
@@ -110,18 +104,14 @@ protected:
         return count;
     }
 
-    std::filesystem::path const folder =
-        std::filesystem::temp_directory_path() / ("moka_refusing_" + std::to_string(getpid()));
+    TempFolder const folder;
     TestImage image = MakeGradient(kWidth, kHeight);
     UnreliableQueue queue{5u, GetParam()};
     LogCapture log;
 };
 
 TEST_P(RefusingLoaderTest, EveryRequestCallsBackOnceButForRefusedReadBacks) {
-    Bitmap picture;
-    String const path = Path("a.mki");
-    ASSERT_TRUE(picture.Construct(image.pixels.data(), kWidth, kHeight, kWidth * 4, 1, false, false));
-    ASSERT_TRUE(BitmapFactory::SaveBitmap(&picture, &path, 100));
+    ASSERT_TRUE(SaveImage(image, folder.Path("a.mki")));
     Calls calls;
     auto gpuCallback = calls.MakeCallback<MKBitmapLoader>();
     auto cpuCallback = calls.MakeCallback<BitmapLoader>();

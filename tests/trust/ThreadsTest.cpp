@@ -1,6 +1,4 @@
 // Four callers, the render thread and the loader at once. Meant for the thread sanitizer.
-#include "moka/base/Bitmap.h"
-#include "moka/base/BitmapFactory.h"
 #include "moka/base/String.h"
 #include "moka/graphics/bitmap/ImageDecoding.h"
 #include "moka/graphics/bitmap/MKGraphicsFactory.h"
@@ -10,15 +8,13 @@
 #include "tests/support/LogCapture.h"
 #include "tests/support/RecordingRenderer.h"
 #include "tests/support/RecordingThread.h"
-#include "tests/support/TestImages.h"
+#include "tests/support/TestFiles.h"
 #include "tests/trust/MixedWork.h"
 
 #include <atomic>
-#include <filesystem>
 #include <gtest/gtest.h>
 #include <string>
 #include <thread>
-#include <unistd.h>
 #include <vector>
 
 namespace Moka::Testing {
@@ -31,14 +27,9 @@ class ThreadsTest : public ::testing::Test {
 protected:
     void SetUp() override {
         MKBitmapFactory_UseNativeDecoder();
-        std::filesystem::create_directories(folder);
-        TestImage image = MakeGradient(5, 4);
-        Bitmap picture;
-        ASSERT_TRUE(picture.Construct(image.pixels.data(), 5, 4, 20, 1, false, false));
-        ASSERT_TRUE(BitmapFactory::SaveBitmap(&picture, &path, 100));
+        ASSERT_TRUE(SaveImage(MakeGradient(5, 4), folder.Path("a.mki")));
         ASSERT_TRUE(MKBitmapLoader::startEventLoopBySelf());
     }
-    void TearDown() override { std::filesystem::remove_all(folder); }
 
     // Loads a picture again and again, draws each onto a bitmap of its own on the loader's thread, and saves
     // the bitmap.
@@ -62,10 +53,9 @@ protected:
         loader.WaitForCallback();
     }
 
-    std::filesystem::path const folder =
-        std::filesystem::temp_directory_path() / ("moka_threads_" + std::to_string(getpid()));
-    String const path{(folder / "a.mki").string()};
-    String const savePath{(folder / "b.mki").string()};
+    TempFolder const folder;
+    String const path{folder.Path("a.mki")};
+    String const savePath{folder.Path("b.mki")};
     std::atomic<int> called{0};
     LogCapture log;
 };

@@ -1,8 +1,5 @@
 #include "tests/trust/TrustFixture.h"
 
-#include "moka/base/Bitmap.h"
-#include "moka/base/BitmapFactory.h"
-#include "moka/base/String.h"
 #include "moka/base/log/LogSink.h"
 #include "moka/graphics/bitmap/ImageDecoding.h"
 #include "moka/graphics/drawable/ShaderManager.h"
@@ -17,7 +14,6 @@
 #include <new>
 #include <sstream>
 #include <typeinfo>
-#include <unistd.h>
 
 namespace Moka::Testing {
 namespace {
@@ -80,14 +76,6 @@ private:
     std::map<std::string, std::map<std::string, std::size_t>> mNames;
 };
 
-void WritePicture(std::filesystem::path const& path) {
-    TestImage image = MakeAlphaPattern(20, 90);
-    Bitmap bitmap;
-    String const name(path.string());
-    ASSERT_TRUE(bitmap.Construct(image.pixels.data(), 20, 90, image.GetStride(), 1, false, false));
-    ASSERT_TRUE(BitmapFactory::SaveBitmap(&bitmap, &name, 100));
-}
-
 template <class... Shaders>
 void Forget() {
     (ShaderManager::GetInstance()->RemoveShader(ShaderManager::Key(typeid(Shaders).name())), ...);
@@ -114,9 +102,7 @@ void SurvivingQueue::Settle() {
 void TrustFixture::SetUp() {
     SetLogSink([](LogLine const&) {}); // error lines are expected
     MKBitmapFactory_UseNativeDecoder();
-    folder = std::filesystem::temp_directory_path() / ("moka_trust_" + std::to_string(getpid()));
-    std::filesystem::create_directories(folder);
-    WritePicture(folder / "picture.png");
+    ASSERT_TRUE(SaveImage(MakeAlphaPattern(20, 90), folder.Path("picture.png")));
     RecordingRenderer::Reset();
     RecordingRenderer::SetMaxTextureSize(kMaxSide);
     ASSERT_TRUE(RendererFactory::AttachContext());
@@ -131,9 +117,8 @@ void TrustFixture::TearDown() {
     ForgetShaders(); // those that a leaked drawable holds die with the renderer's next reset
     RecordingRenderer::DeclareRenderThread();
     RendererFactory::DetachContext();
-    for (auto const& file : std::filesystem::directory_iterator(folder))
-        EXPECT_NE(file.path().extension(), ".tmp") << "a save left its temporary file";
-    std::filesystem::remove_all(folder);
+    for (std::string const& name : folder.List())
+        EXPECT_EQ(name.find(".tmp"), std::string::npos) << "a save left its temporary file " << name;
     SetLogSink({});
 }
 
@@ -145,7 +130,7 @@ void TrustFixture::ForgetShaders() {
 
 void TrustFixture::RunScenario() {
     try {
-        GetParam().run({queue, [this] { queue.Settle(); }, folder.string()});
+        GetParam().run({queue, [this] { queue.Settle(); }, folder.GetPath().string()});
     } catch (std::bad_alloc const&) {
     }
     queue.Settle();

@@ -3,9 +3,9 @@
 #pragma once
 
 #include "tests/support/Queues.h"
+#include "tests/support/TestFiles.h"
 #include "tests/trust/Scenarios.h"
 
-#include <filesystem>
 #include <gtest/gtest.h>
 #include <string>
 #include <vector>
@@ -41,7 +41,7 @@ protected:
     static void ForgetShaders();
 
     SurvivingQueue queue;
-    std::filesystem::path folder;
+    TempFolder const folder;
 };
 
 } // namespace Moka::Testing

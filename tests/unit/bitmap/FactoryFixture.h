@@ -5,27 +5,16 @@
 #include "moka/base/BitmapFactory.h"
 #include "moka/base/String.h"
 #include "tests/support/LogCapture.h"
+#include "tests/support/TestFiles.h"
 #include "tests/unit/bitmap/BitmapFixture.h"
 
-#include <filesystem>
 #include <string>
-#include <unistd.h>
 
 namespace Moka::Testing {
 
 class Factory : public BitmapFixture {
 protected:
-    void SetUp() override {
-        BitmapFixture::SetUp();
-        folder = std::filesystem::temp_directory_path() / ("moka_factory_" + std::to_string(getpid()));
-        std::filesystem::create_directories(folder);
-    }
-    void TearDown() override {
-        BitmapFixture::TearDown();
-        std::filesystem::remove_all(folder);
-    }
-
-    String Path(char const* name) const { return String((folder / name).string()); }
+    String Path(char const* name) const { return String(folder.Path(name)); }
 
     // A picture file of unique opaque pixels.
     String Save(char const* name, int width, int height) const {
@@ -37,7 +26,7 @@ protected:
         return path;
     }
 
-    std::filesystem::path folder;
+    TempFolder folder;
     LogCapture log;
 };
 

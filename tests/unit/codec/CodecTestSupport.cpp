@@ -7,7 +7,6 @@
 
 #include <algorithm>
 #include <cmath>
-#include <filesystem>
 #include <fstream>
 #include <gtest/gtest.h>
 #include <iterator>
@@ -91,22 +90,6 @@ int LargestDifference(Image const& a, Image const& b) {
         largest = std::max(largest, std::abs(a.pixels[i] - b.pixels[i]));
     }
     return largest;
-}
-
-TempFolder::TempFolder() {
-    std::string pattern = (std::filesystem::temp_directory_path() / "moka-codec-XXXXXX").string();
-    mPath = mkdtemp(pattern.data());
-}
-
-TempFolder::~TempFolder() { std::filesystem::remove_all(mPath); }
-
-std::vector<std::string> TempFolder::List() const {
-    std::vector<std::string> names;
-    for (auto const& entry : std::filesystem::directory_iterator(mPath)) {
-        names.push_back(entry.path().filename().string());
-    }
-    std::sort(names.begin(), names.end());
-    return names;
 }
 
 void WriteFile(std::string const& path, Bytes const& bytes) {

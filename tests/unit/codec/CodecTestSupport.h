@@ -1,8 +1,9 @@
-// CodecTestSupport.h: pictures, temporary folders and captured log lines for the tests of the image codecs.
+// CodecTestSupport.h: pictures, files and captured log lines for the tests of the image codecs.
 #pragma once
 
 #include "moka/base/BitmapFactory.h"
 #include "moka/base/log/LogSink.h"
+#include "tests/support/TestFiles.h"
 
 #include <cstdint>
 #include <string>
@@ -40,21 +41,6 @@ Image Scale(Image const& source, int width, int height);
 
 // The greatest difference of any byte; 256 when the sizes differ.
 int LargestDifference(Image const& a, Image const& b);
-
-// A folder that goes, with its files, at the end of the test.
-class TempFolder {
-public:
-    TempFolder();
-    ~TempFolder();
-    TempFolder(TempFolder const&) = delete;
-    TempFolder& operator=(TempFolder const&) = delete;
-
-    std::string Path(std::string const& name) const { return mPath + "/" + name; }
-    std::vector<std::string> List() const; // sorted
-
-private:
-    std::string mPath;
-};
 
 void WriteFile(std::string const& path, Bytes const& bytes);
 Bytes ReadFile(std::string const& path);

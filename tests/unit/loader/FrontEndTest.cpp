@@ -228,7 +228,7 @@ TEST_F(FrontEnd, BitmapsAreSavedAndTheLoaderFreesACpuBitmapsPixels) {
         EXPECT_FALSE(cpu.RequestSave(3, Path("e.png"), empty, nullptr, 100));
     }
     AwaitAll();
-    EncodeDirectly(image, Path("direct.png"));
+    EXPECT_TRUE(SaveImage(image, folder.Path("direct.png")));
     for (char const* name : {"g.png", "c.png"}) EXPECT_EQ(ReadBytes(name), ReadBytes("direct.png"));
     EXPECT_EQ(listener.GetEvents().size(), 2u);
 }

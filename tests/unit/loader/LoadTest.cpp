@@ -77,7 +77,8 @@ TEST_F(Load, LogsEachStep) {
     log.Clear();
     Request(2, Path("missing.mki"), BITMAP_TYPE_GRAPHICS);
     AwaitLine("BitmapLoaderImpl::EventLoop Wait!");
-    EXPECT_EQ(log.Count(ANDROID_LOG_INFO, folder.string()), 0) << "paths are for engineering builds";
+    EXPECT_EQ(log.Count(ANDROID_LOG_INFO, folder.GetPath().string()), 0)
+        << "paths are for engineering builds";
     EXPECT_EQ(log.Find("BitmapLoaderImpl::LoadBitmap (CreateScaledCPUBitmap): bitmap is null").priority,
               ANDROID_LOG_ERROR);
     EXPECT_TRUE(log.Has("BitmapLoaderImpl::LoadBitmap Call OnLoadError finish."));
@@ -143,7 +144,8 @@ TEST_F(Load, CancelAllDropsTheLoadsOfOneListenerAndNothingElse) {
 
 TEST_F(Load, BrokenFilesAreErrorsAndTheLoopGoesOn) {
     WritePicture("cut.png", 30, 30);
-    std::filesystem::resize_file(folder / "cut.png", std::filesystem::file_size(folder / "cut.png") / 2);
+    std::filesystem::resize_file(folder.Path("cut.png"),
+                                 std::filesystem::file_size(folder.Path("cut.png")) / 2);
     String const paths[] = {Path("missing.png"), Path("cut.png"), Path(std::string(700, 'x')), String("")};
     int count = 0;
     Events expected;
@@ -161,7 +163,7 @@ TEST_F(Load, BrokenFilesAreErrorsAndTheLoopGoesOn) {
 
 TEST_F(Load, ALongPathOfAnyTextIsFoundAndItsLogLineCutAtACharacter) {
     System::SetBuildTypeEngMode(true);
-    std::filesystem::path deep = folder;
+    std::filesystem::path deep = folder.GetPath();
     while (deep.native().size() < 700) deep /= "\xe7\xb4\x99\xf0\x9f\x96\x8a\xc3\xa9 folder";
     std::filesystem::create_directories(deep);
     String const path = WritePicture(deep / "\xe7\x94\xbb.mki");

@@ -16,7 +16,7 @@
 #include "tests/support/LogCapture.h"
 #include "tests/support/RecordingRenderer.h"
 #include "tests/support/RecordingThread.h"
-#include "tests/support/TestImages.h"
+#include "tests/support/TestFiles.h"
 #include "tests/unit/loader/CodecGate.h"
 
 #include <algorithm>
@@ -32,8 +32,6 @@
 #include <string>
 #include <thread>
 #include <vector>
-
-#include <unistd.h>
 
 namespace Moka::Testing {
 
@@ -57,8 +55,6 @@ protected:
 
     void SetUp() override {
         MKBitmapFactory_UseNativeDecoder();
-        folder = std::filesystem::temp_directory_path() / ("moka_loader_" + std::to_string(getpid()));
-        std::filesystem::create_directories(folder);
         queue = std::make_unique<RecordingThread>(kMaxSide);
         StartLoop();
     }
@@ -71,32 +67,23 @@ protected:
         queue.reset();
         EXPECT_EQ(RecordingRenderer::CountLiveObjects(), 0);
         for (std::string const& violation : RecordingRenderer::GetViolations()) ADD_FAILURE() << violation;
-        std::filesystem::remove_all(folder);
     }
 
     virtual void StartLoop() { ASSERT_TRUE(MKBitmapLoader::startEventLoopBySelf()); }
 
     static BitmapLoaderImpl& Loader() { return BitmapLoaderImpl::GetInstance(); }
 
-    String Path(std::string const& name) const { return String((folder / name).string()); }
-    bool Exists(std::string const& name) const { return std::filesystem::exists(folder / name); }
+    String Path(std::string const& name) const { return String(folder.Path(name)); }
+    bool Exists(std::string const& name) const { return std::filesystem::exists(folder.Path(name)); }
 
     // A picture file of unique opaque pixels.
     String WritePicture(std::string const& name, int width = 5, int height = 4) const {
-        TestImage image = MakeGradient(width, height);
-        String const path = Path(name);
-        EXPECT_TRUE(EncodeDirectly(image, path));
-        return path;
+        EXPECT_TRUE(SaveImage(MakeGradient(width, height), folder.Path(name)));
+        return Path(name);
     }
     std::string ReadBytes(std::string const& name) const {
-        std::ifstream file(folder / name, std::ios::binary);
+        std::ifstream file(folder.Path(name), std::ios::binary);
         return {std::istreambuf_iterator<char>(file), {}};
-    }
-    static bool EncodeDirectly(TestImage& image, String const& path, int quality = 100) {
-        Bitmap bitmap;
-        return bitmap.Construct(image.pixels.data(), image.width, image.height, image.GetStride(), 1, false,
-                                false) &&
-               BitmapFactory::SaveBitmap(&bitmap, &path, quality);
     }
 
     static unsigned char* NewPixels(TestImage const& image) {
@@ -130,7 +117,7 @@ protected:
         return texts;
     }
 
-    std::filesystem::path folder;
+    TempFolder folder;
     LogCapture log;
     std::unique_ptr<RecordingThread> queue;
 };

@@ -1,31 +1,23 @@
 // Loads in a process that has nothing to decode the platform's foreign formats with. On its own, because a
 // process does not go back to being without the native decoder.
 #include "moka/base/Bitmap.h"
-#include "moka/base/BitmapFactory.h"
 #include "moka/graphics/loader/BitmapLoader.h"
 #include "moka/graphics/loader/MKBitmapLoader.h"
 #include "tests/support/LogCapture.h"
-#include "tests/support/TestImages.h"
+#include "tests/support/TestFiles.h"
 
-#include <filesystem>
 #include <gtest/gtest.h>
 #include <memory>
 #include <string>
-
-#include <unistd.h>
 
 namespace Moka::Testing {
 namespace {
 
 TEST(NoDecoder, CpuLoadsDoWithoutItAndGpuLoadsDoNot) {
     LogCapture const log;
-    auto const file =
-        std::filesystem::temp_directory_path() / ("moka_no_decoder_" + std::to_string(getpid()) + ".png");
-    String const path(file.string());
-    TestImage image = MakeGradient(5, 4);
-    Bitmap bitmap;
-    ASSERT_TRUE(bitmap.Construct(image.pixels.data(), 5, 4, 20, 1, false, false));
-    ASSERT_TRUE(BitmapFactory::SaveBitmap(&bitmap, &path, 100));
+    TempFolder const folder;
+    String const path(folder.Path("a.png"));
+    ASSERT_TRUE(SaveImage(MakeGradient(5, 4), folder.Path("a.png")));
 
     std::unique_ptr<Bitmap> onCpu;
     int errors = 0;
@@ -46,7 +38,6 @@ TEST(NoDecoder, CpuLoadsDoWithoutItAndGpuLoadsDoNot) {
     EXPECT_EQ(onCpu->GetWidth(), 5);
     EXPECT_EQ(errors, 1);
     EXPECT_TRUE(log.Has("MKBitmapFactory : gDecodeFile Not loaded"));
-    std::filesystem::remove(file);
 }
 
 } // namespace

@@ -70,7 +70,7 @@ TEST_F(SaveManager, TwoResultsShareOneMessageAndComeInOrder) {
     EXPECT_EQ(results, (Events{"saved a.png", "failed b.png"}));
     EXPECT_EQ(lastUserData, this);
     EXPECT_EQ(manager.GetRequestSaveCount(), 0);
-    EXPECT_TRUE(EncodeDirectly(image, Path("direct.png")));
+    EXPECT_TRUE(SaveImage(image, folder.Path("direct.png")));
     EXPECT_EQ(ReadBytes("a.png"), ReadBytes("direct.png"));
     EXPECT_EQ(messages.RunPending(), 0);
     for (char const* rest : {"RequestSave mSaveCount(1)", "RequestSave mSaveCount(2)",

@@ -35,7 +35,7 @@ protected:
                                     userData, quality);
     }
     std::string EncodedDirectly(std::string const& extension, int quality = 100) {
-        EXPECT_TRUE(EncodeDirectly(image, Path("direct." + extension), quality));
+        EXPECT_TRUE(SaveImage(image, folder.Path("direct." + extension), quality));
         return ReadBytes("direct." + extension);
     }
 

@@ -1,0 +1,31 @@
+// TestFiles.h: image files of a test's own.
+#pragma once
+
+#include "tests/support/TestImages.h"
+
+#include <filesystem>
+#include <string>
+#include <vector>
+
+namespace Moka::Testing {
+
+// A folder that goes, with its files, at the end of its scope.
+class TempFolder {
+public:
+    TempFolder();
+    ~TempFolder();
+    TempFolder(TempFolder const&) = delete;
+    TempFolder& operator=(TempFolder const&) = delete;
+
+    std::filesystem::path const& GetPath() const { return mPath; }
+    std::string Path(std::string const& name) const { return (mPath / name).string(); }
+    std::vector<std::string> List() const; // sorted
+
+private:
+    std::filesystem::path mPath;
+};
+
+// In the format of the path's extension. Whether it could.
+[[nodiscard]] bool SaveImage(TestImage const& image, std::string const& path, int quality = 100);
+
+} // namespace Moka::Testing
