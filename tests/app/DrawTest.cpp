@@ -58,7 +58,7 @@ TEST_F(DrawTest, DrawsTheExamplesOfTheDocuments) {
     EXPECT_THAT(image.GetColor(19, 120), ElementsAre(0x2A, 0x4A, 0x6A, 255)); // its frame
     EXPECT_THAT(image.GetColor(260, 120), ElementsAre(0x2A, 0x4A, 0x6A, 255));
     // A petal: 0x90 of 255 of its colour over the background.
-    EXPECT_NEAR(image.GetColor(287, 120)[0], 0xC0 * 0x90 / 255 + 0xF7 * (255 - 0x90) / 255, 1);
+    EXPECT_NEAR(image.GetColor(287, 120)[0], (0xC0 * 0x90 + 0xF7 * (255 - 0x90)) / 255.0, 1);
     EXPECT_NE(image.GetColor(100, 110), image.GetColor(30, 200)); // the photograph
 
     WriteFile("readme.json", ReadExample("README.md"));

@@ -34,6 +34,7 @@ using Undo = std::function<void()>;
 template <class Value>
 Value ReadFrom(ITask* task, std::size_t offset) {
     Value value;
+    // NOLINTNEXTLINE(bugprone-sizeof-expression): a pointer's own size is meant
     std::memcpy(&value, reinterpret_cast<unsigned char const*>(task) + offset, sizeof value);
     return value;
 }

@@ -136,7 +136,7 @@ TEST_F(ClipTest, ClearingStaysInsideAStencilClipAndClearingAllDoesNot) {
         ExpectLikeReference({MakeBackdrop(kWidth, kHeight),
                              [](IMKCanvas& canvas, Scenes::SceneStage&) {
                                  SetStencilClip(canvas);
-                                 canvas.ClearAll(0x80402010);
+                                 canvas.ClearAll(static_cast<int>(0x80402010));
                                  canvas.Restore(-1);
                                  canvas.Clear(static_cast<int>(0xFF00FF00));
                              }},

@@ -59,9 +59,11 @@ TEST_F(CoverageTest, ACornerTakesTheLesserOfItsTwoRamps) {
 TEST_F(CoverageTest, RectanglesAtQuarterPixels) {
     ExpectInEveryStyle(MakeBackdrop(96, 96), "quarters", [](IMKCanvas& canvas, MKPaint const& paint) {
         for (int i = 0; i < 16; ++i) {
-            float const x = 6 + 24.0f * static_cast<float>(i % 4) + kQuarters[i % 4];
-            float const y = 6 + 24.0f * static_cast<float>(i / 4) + kQuarters[i / 4];
-            canvas.DrawRect(x, y, x + 11 + kQuarters[i / 4], y + 12.5f, &paint);
+            int const column = i % 4;
+            int const row = i / 4;
+            float const x = 6 + 24.0f * static_cast<float>(column) + kQuarters[column];
+            float const y = 6 + 24.0f * static_cast<float>(row) + kQuarters[row];
+            canvas.DrawRect(x, y, x + 11 + kQuarters[row], y + 12.5f, &paint);
         }
     });
 }

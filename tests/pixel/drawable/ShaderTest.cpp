@@ -103,8 +103,9 @@ protected:
         auto const atCorners = [](auto const& value) {
             RawAttribute attribute{};
             for (int corner = 0; corner < 4; ++corner) {
-                auto const at =
-                    value(static_cast<float>(corner % 2 * kWidth), static_cast<float>(corner / 2 * kHeight));
+                int const x = corner % 2 * kWidth;
+                int const y = corner / 2 * kHeight;
+                auto const at = value(static_cast<float>(x), static_cast<float>(y));
                 attribute.components = static_cast<int>(at.size());
                 attribute.values.insert(attribute.values.end(), at.begin(), at.end());
             }

@@ -51,7 +51,7 @@ TEST_F(WindowTest, WhatIsDrawnOnAScreenBitmapIsShownWhenPresented) {
     canvas->ClearAll(static_cast<int>(0xFF0000FF));
     MKPaint paint;
     paint.SetColor(static_cast<int>(0xFFFF0000));
-    canvas->DrawRect(0, 0, kWidth, kHeight / 2, &paint);
+    canvas->DrawRect(0, 0, kWidth, kHeight / 2.0f, &paint);
     EXPECT_TRUE(thread->Present());
     EXPECT_TRUE(ShowsSoon(5, 5, 0xFF0000)); // the upper half, not the lower one
     EXPECT_TRUE(ShowsSoon(5, kHeight - 5, 0x0000FF));

@@ -11,7 +11,6 @@ namespace Moka::Testing {
 namespace {
 
 using ::testing::AllOf;
-using ::testing::ElementsAre;
 using ::testing::HasSubstr;
 using ParameterPtr = std::unique_ptr<IParameterBinding>;
 

@@ -13,9 +13,9 @@ class TextureTransferTest : public RendererFixture {};
 
 // Pixel-store values that would ruin any transfer that trusts in the defaults.
 void LeavePixelStoreDirty(GLuint buffer) {
-    for (GLenum name : {GL_UNPACK_ROW_LENGTH, GL_UNPACK_SKIP_ROWS, GL_UNPACK_SKIP_PIXELS, GL_PACK_ROW_LENGTH,
-                        GL_PACK_SKIP_ROWS, GL_PACK_SKIP_PIXELS}) {
-        glPixelStorei(name, 3);
+    for (int const name : {GL_UNPACK_ROW_LENGTH, GL_UNPACK_SKIP_ROWS, GL_UNPACK_SKIP_PIXELS,
+                           GL_PACK_ROW_LENGTH, GL_PACK_SKIP_ROWS, GL_PACK_SKIP_PIXELS}) {
+        glPixelStorei(static_cast<GLenum>(name), 3);
     }
     glPixelStorei(GL_UNPACK_ALIGNMENT, 1);
     glPixelStorei(GL_PACK_ALIGNMENT, 8);
@@ -24,10 +24,10 @@ void LeavePixelStoreDirty(GLuint buffer) {
 }
 
 void ExpectDefaultPixelStore() {
-    for (GLenum name : {GL_UNPACK_ROW_LENGTH, GL_UNPACK_SKIP_ROWS, GL_UNPACK_SKIP_PIXELS, GL_PACK_ROW_LENGTH,
-                        GL_PACK_SKIP_ROWS, GL_PACK_SKIP_PIXELS, GL_PIXEL_UNPACK_BUFFER_BINDING,
-                        GL_PIXEL_PACK_BUFFER_BINDING}) {
-        EXPECT_EQ(GetInteger(name), 0) << std::hex << name;
+    for (int const name : {GL_UNPACK_ROW_LENGTH, GL_UNPACK_SKIP_ROWS, GL_UNPACK_SKIP_PIXELS,
+                           GL_PACK_ROW_LENGTH, GL_PACK_SKIP_ROWS, GL_PACK_SKIP_PIXELS,
+                           GL_PIXEL_UNPACK_BUFFER_BINDING, GL_PIXEL_PACK_BUFFER_BINDING}) {
+        EXPECT_EQ(GetInteger(static_cast<GLenum>(name)), 0) << std::hex << name;
     }
     EXPECT_EQ(GetInteger(GL_UNPACK_ALIGNMENT), 4);
     EXPECT_EQ(GetInteger(GL_PACK_ALIGNMENT), 4);

@@ -66,7 +66,7 @@ TEST(StringTest, BufferConversionCutsAtACharacterAndTerminates) {
     String const text = FromUnits(u"aä€\U0001f600b"); // characters end at bytes 1, 3, 6, 10, 11
     std::string const whole = text.ToUtf8();
     int room = 0;
-    for (std::size_t const used : {0, 1, 1, 3, 3, 3, 6, 6, 6, 6, 10, 11, 11, 11}) {
+    for (std::size_t const used : {0u, 1u, 1u, 3u, 3u, 3u, 6u, 6u, 6u, 6u, 10u, 11u, 11u, 11u}) {
         std::string buffer(20, '#');
         EXPECT_EQ(text.ToUtf8(buffer.data(), room), static_cast<int>(used)) << room;
         EXPECT_EQ(buffer, whole.substr(0, used) + '\0' + std::string(19 - used, '#')) << room;

@@ -103,7 +103,7 @@ TEST_F(TaskQueueTest, RunsOrRefusesEveryTaskThatRacesWithStop) {
                 for (int i = 0;; ++i) {
                     std::unique_ptr<FunctionTask> task(MakeTask([&ran] { ++ran; }));
                     if (!queue.Post(task.get())) return;
-                    task.release();
+                    static_cast<void>(task.release());
                     ++accepted;
                     if (i % 3 == 2) queue.WaitForTasks();
                 }

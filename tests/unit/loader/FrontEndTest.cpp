@@ -37,7 +37,7 @@ protected:
     }
 };
 using FrontEnds = ::testing::Types<MKBitmapLoader, BitmapLoader>;
-TYPED_TEST_SUITE(EitherFrontEnd, FrontEnds);
+TYPED_TEST_SUITE(EitherFrontEnd, FrontEnds, );
 
 TYPED_TEST(EitherFrontEnd, LogsAndCallsInBothKindsOfBuild) {
     TestImage const image = MakeGradient(5, 4);
