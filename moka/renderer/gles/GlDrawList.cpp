@@ -39,9 +39,10 @@ std::size_t GlDrawList::AddUniforms(GlUniforms& program) {
         listed.isStale = false;
         return listed.offset;
     }
-    listed = {mNumber, mUniforms.size(), false};
-    mUniforms.insert(mUniforms.end(), values, values + size);
-    return listed.offset;
+    std::size_t const offset = mUniforms.size();
+    mUniforms.insert(mUniforms.end(), values, values + size); // may throw, and then nothing is listed
+    listed = {mNumber, offset, false};
+    return offset;
 }
 
 // A run starts at a whole vertex, counted in vertices of its own layout.
