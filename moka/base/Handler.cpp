@@ -33,10 +33,7 @@ Handler::~Handler() {
     auto const& queue = mState->queue;
     std::unique_lock<std::mutex> lock(queue->mutex);
     mState->closed = true;
-    auto& messages = queue->messages;
-    messages.erase(std::remove_if(messages.begin(), messages.end(),
-                                  [this](Message const& message) { return message.target == mState; }),
-                   messages.end());
+    queue->messages.remove_if([this](Message const& message) { return message.target == mState; });
     if (queue->owner == std::this_thread::get_id()) return;
     queue->finished.wait(lock, [this] { return mState->running == 0; });
 }

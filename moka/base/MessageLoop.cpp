@@ -49,7 +49,7 @@ MessageLoop::MessageLoop() : mQueue(std::make_shared<MessageQueue>()) {
 MessageLoop::~MessageLoop() {
     MOKA_CHECK(currentLoop == this, "a MessageLoop is destroyed by the thread that made it");
     currentLoop = nullptr;
-    std::deque<Message> dropped; // freed after the lock: the last message may own its handler's state
+    std::list<Message> dropped; // freed after the lock: the last message may own its handler's state
     std::lock_guard<std::mutex> const lock(mQueue->mutex);
     mQueue->closed = true;
     mQueue->messages.swap(dropped);

@@ -5,7 +5,7 @@
 
 #include <condition_variable>
 #include <cstdint>
-#include <deque>
+#include <list>
 #include <memory>
 #include <mutex>
 #include <thread>
@@ -29,7 +29,7 @@ struct MessageQueue {
     std::mutex mutex;
     std::condition_variable changed;  // a message came, or Quit
     std::condition_variable finished; // a message of a handler that is being destroyed has run
-    std::deque<Message> messages;
+    std::list<Message> messages;      // a deque would allocate even where it is empty, in destructors too
     std::uint64_t nextSerial = 0;
     bool quit = false;
     bool closed = false; // the loop is gone

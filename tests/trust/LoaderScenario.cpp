@@ -1,9 +1,11 @@
+#include "moka/base/MessageLoop.h"
 #include "moka/base/RefPtr.h"
 #include "moka/base/String.h"
 #include "moka/graphics/bitmap/IMKBitmap.h"
 #include "moka/graphics/bitmap/MKGraphicsFactory.h"
 #include "moka/graphics/loader/BitmapLoader.h"
 #include "moka/graphics/loader/MKBitmapLoader.h"
+#include "moka/graphics/loader/MKBitmapSaveManager.h"
 #include "tests/trust/Scenarios.h"
 
 #include <atomic>
@@ -66,6 +68,14 @@ void SavePixels(BitmapLoader& loader, Book& book, String const& path) {
     book.Expect(isAccepted);
 }
 
+// A save that was refused stays counted, and waiting for it would not end.
+void SaveManaged(Stage const& stage, IMKBitmap& bitmap, String const& path) {
+    MessageLoop loop;
+    MKBitmapSaveManager manager;
+    if (manager.RequestSave(3, path, bitmap, nullptr, 100)) manager.WaitForSaveCompleting(&stage.queue);
+    loop.RunPending();
+}
+
 void LoadAndSaveInBackground(Stage const& stage) {
     if (!MKBitmapLoader::startEventLoopBySelf()) return;
     LoaderAtRest const atRest(stage);
@@ -84,6 +94,7 @@ void LoadAndSaveInBackground(Stage const& stage) {
     if (bitmap) book.Expect(gpu.RequestSave(2, saved, *bitmap, nullptr, 100));
     SavePixels(cpu, book, saved);
     book.Await(stage);
+    if (bitmap) SaveManaged(stage, *bitmap, saved);
 }
 
 } // namespace

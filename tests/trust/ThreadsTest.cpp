@@ -1,8 +1,10 @@
-// Four callers, the render thread and the loader at once. Meant for the thread sanitizer.
+// Four callers, the render thread, the loader and two message loops at once. Meant for the thread sanitizer.
+#include "moka/base/MessageLoop.h"
 #include "moka/base/String.h"
 #include "moka/graphics/bitmap/ImageDecoding.h"
 #include "moka/graphics/bitmap/MKGraphicsFactory.h"
 #include "moka/graphics/loader/MKBitmapLoader.h"
+#include "moka/graphics/loader/MKBitmapSaveManager.h"
 #include "moka/host/TaskQueue.h"
 #include "moka/renderer/RendererFactory.h"
 #include "tests/support/LogCapture.h"
@@ -38,19 +40,42 @@ protected:
             &queue, MixedWork::kSide, MixedWork::kHeight, nullptr, false, 1, false));
         auto const canvas =
             RefPtr<IMKCanvas>::Adopt(MKGraphicsFactory::CreateCanvas(&queue, target.Get(), 1));
+        std::atomic<int> own{0};
         MKBitmapLoader::Callback callback;
         callback.onLoad = [&](int, String const&, IMKBitmap& loaded) {
             canvas->DrawBitmap(&loaded, 0, 0, nullptr);
-            ++called;
+            ++own;
         };
-        callback.onSave = [&](int, String const&, void*) { ++called; };
+        callback.onSave = [&](int, String const&, void*) { ++own; };
         MKBitmapLoader loader(nullptr, &callback);
         for (int id = 0; id < kLoads; ++id) {
             EXPECT_TRUE(loader.RequestLoad(id, path, &queue));
             EXPECT_TRUE(loader.RequestSave(id, savePath, *target, nullptr, 100));
         }
-        while (called < 2 * kLoads) std::this_thread::yield();
+        while (own < 2 * kLoads) std::this_thread::yield();
         loader.WaitForCallback();
+        called += own;
+    }
+
+    // Saves what all draw, and hears of it through the thread's message loop.
+    void SaveManaged(IGLMsgQueue& queue, IMKBitmap& bitmap, std::string const& name) {
+        MessageLoop loop;
+        MKBitmapSaveManager manager;
+        std::atomic<int>* const count = &called;
+        MKBitmapSaveManager::SaveCallback callback;
+        callback.context = count;
+        callback.onSaveSucceeded = [](void* counter, String const*, void*) {
+            ++*static_cast<std::atomic<int>*>(counter);
+        };
+        for (int id = 0; id < kLoads; ++id) {
+            EXPECT_TRUE(manager.RequestSave(id, String(folder.Path(name)), bitmap, &callback, 100));
+            loop.RunPending();
+        }
+        while (manager.GetRequestSaveCount() > kLoads / 2) {
+            loop.RunPending();
+            std::this_thread::yield();
+        }
+        manager.WaitForSaveCompleting(&queue);
     }
 
     TempFolder const folder;
@@ -60,7 +85,7 @@ protected:
     LogCapture log;
 };
 
-TEST_F(ThreadsTest, RandomCallersAndTheLoaderShareOneRenderThread) {
+TEST_F(ThreadsTest, RandomCallersTheLoaderAndHandlersShareOneRenderThread) {
     {
         RecordingThread queue(MixedWork::kSide);
         auto const shared = RefPtr<IMKBitmap>::Adopt(MKGraphicsFactory::CreateBitmap(
@@ -72,10 +97,12 @@ TEST_F(ThreadsTest, RandomCallersAndTheLoaderShareOneRenderThread) {
                 for (int i = 0; i < kSteps; ++i) work.Step();
             });
         threads.emplace_back([&] { LoadDrawAndSave(queue); });
+        for (char const* const name : {"c.mki", "d.png"})
+            threads.emplace_back([&, name] { SaveManaged(queue, *shared, name); });
         for (std::thread& thread : threads) thread.join();
         MKBitmapLoader::WaitForAllSaveRequestsToEnd(&queue);
     }
-    EXPECT_EQ(called, 2 * kLoads);
+    EXPECT_EQ(called, 4 * kLoads);
     EXPECT_EQ(RecordingRenderer::CountLiveObjects(), 0);
     EXPECT_TRUE(RecordingRenderer::GetViolations().empty());
 }
