@@ -32,9 +32,14 @@ ShaderManager::Entry& ShaderManager::Add(char const* name, void* shader) {
 
 ShaderManager::Entries::iterator ShaderManager::FindToRelease(char const* name, void const* shader) {
     auto const found = mEntries.find(name);
-    if (found != mEntries.end() && found->second.shader == shader) return found;
-    __android_log_print(ANDROID_LOG_ERROR, "mok_log", "%s. Shader (%s) not in shader manager (%s).",
-                        "ReleaseShader", name, found == mEntries.end() ? "not found" : "pointer mismatch");
+    if (found == mEntries.end()) {
+        __android_log_print(ANDROID_LOG_ERROR, "mok_log",
+                            "%s. Shader (%s) not in shader manager (not found).", "ReleaseShader", name);
+        return found;
+    }
+    if (found->second.shader == shader) return found;
+    __android_log_print(ANDROID_LOG_ERROR, "mok_log",
+                        "%s. Shader (%s) not in shader manager (pointer mismatch).", "ReleaseShader", name);
     return mEntries.end();
 }
 
