@@ -10,6 +10,7 @@
 #include "tests/trust/MixedWork.h"
 
 #include <algorithm>
+#include <cstddef>
 #include <cstdint>
 #include <cstdio>
 #include <cstdlib>
@@ -68,17 +69,16 @@ void AwaitIdle(IGLMsgQueue& queue) {
     for (int i = 0; i < kDeepest; ++i) queue.WaitForTasks();
 }
 
-// Bytes for each call, by least squares.
+// Bytes for each call: the median of the slopes between any two samples. A leak raises them all; a pool of the
+// driver's that grows once, at whatever time, does not move it.
 double GetSlope(std::vector<Sample> const& samples, double Sample::*value) {
-    double n = 0, x = 0, y = 0, xx = 0, xy = 0;
-    for (std::size_t i = kWarmUp; i < samples.size(); ++i) {
-        n += 1;
-        x += samples[i].calls;
-        y += samples[i].*value;
-        xx += samples[i].calls * samples[i].calls;
-        xy += samples[i].calls * samples[i].*value;
-    }
-    return (n * xy - x * y) / (n * xx - x * x);
+    std::vector<double> slopes;
+    for (std::size_t i = kWarmUp; i < samples.size(); ++i)
+        for (std::size_t j = i + 1; j < samples.size(); ++j)
+            slopes.push_back((samples[j].*value - samples[i].*value) / (samples[j].calls - samples[i].calls));
+    auto const middle = slopes.begin() + static_cast<std::ptrdiff_t>(slopes.size() / 2);
+    std::nth_element(slopes.begin(), middle, slopes.end());
+    return *middle;
 }
 
 // Uses every program for as long as it lives. Without it they are compiled anew again and again, and what
