@@ -17,7 +17,8 @@ std::unique_ptr<Bitmap> Load(std::string const& path) {
 }
 
 unsigned char const* PixelAt(Bitmap const& image, int x, int y) {
-    return image.GetBuffer() + static_cast<std::ptrdiff_t>(image.GetStride()) * y + std::ptrdiff_t{4} * x;
+    auto const row = static_cast<std::size_t>(image.GetStride()) * static_cast<std::size_t>(y);
+    return &image.GetBuffer()[row + 4 * static_cast<std::size_t>(x)];
 }
 
 } // namespace
