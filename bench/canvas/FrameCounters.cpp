@@ -53,7 +53,7 @@ void FrameCounters::ReportStatistics() {
         mState.counters[name] = static_cast<double>(after.*member - before.*member);
     };
     report("draws", &RendererStatistics::draws);
-    report("plays", &RendererStatistics::plays);
+    report("flushes", &RendererStatistics::flushes);
     report("targets", &RendererStatistics::frameBufferSwitches);
     report("programs", &RendererStatistics::programSwitches);
     report("uniforms", &RendererStatistics::uniformChanges);

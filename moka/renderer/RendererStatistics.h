@@ -24,7 +24,7 @@ struct RendererStatistics {
     // What was asked for, and what of it reached the driver.
     std::uint64_t drawRequests = 0;
     std::uint64_t draws = 0;
-    std::uint64_t plays = 0;     // of the draw list
+    std::uint64_t flushes = 0;   // of the draw list
     std::uint64_t listBytes = 0; // memory that the draw list holds
 
     // Calls that change what the driver has.

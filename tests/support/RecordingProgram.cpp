@@ -1,4 +1,4 @@
-#include "moka/renderer/gles/GlslDeclarations.h"
+#include "moka/renderer/device/GlslDeclarations.h"
 #include "tests/support/RecordingObjects.h"
 
 #include <algorithm>

@@ -1,7 +1,7 @@
 #include "moka/renderer/gles/GlDebug.h"
 
 #include "moka/base/log/AndroidLog.h"
-#include "moka/renderer/gles/GlStatistics.h"
+#include "moka/renderer/device/Counters.h"
 
 #include <algorithm>
 #include <cstring>
@@ -9,12 +9,15 @@
 namespace Moka::detail {
 namespace {
 
+// The device's, while it exists: calls are checked on the one render thread.
+GlDebug* theDebug = nullptr;
+
 bool HasExtension(char const* name) {
     GLint count = 0;
-    glGetIntegerv(GL_NUM_EXTENSIONS, &count);
+    Gl::GetIntegerv(GL_NUM_EXTENSIONS, &count);
     for (GLint i = 0; i < count; ++i) {
         auto const* const text =
-            reinterpret_cast<char const*>(glGetStringi(GL_EXTENSIONS, static_cast<GLuint>(i)));
+            reinterpret_cast<char const*>(Gl::GetStringi(GL_EXTENSIONS, static_cast<GLuint>(i)));
         if (text && std::strcmp(text, name) == 0) return true;
     }
     return false;
@@ -27,10 +30,10 @@ bool IsError(GLenum type, GLenum severity) {
 }
 
 void GL_APIENTRY OnMessage(GLenum source, GLenum type, GLuint, GLenum severity, GLsizei,
-                           GLchar const* message, void const* statistics) {
+                           GLchar const* message, void const* counters) {
     // What a compiler has to say is logged, with the program's name, by who asked for the compilation.
     if (source == GL_DEBUG_SOURCE_SHADER_COMPILER_KHR || !IsError(type, severity)) return;
-    ++static_cast<GlStatistics*>(const_cast<void*>(statistics))->errors;
+    ++static_cast<Counters*>(const_cast<void*>(counters))->errors;
     __android_log_print(ANDROID_LOG_ERROR, "mok_log", "GL driver: %s", message);
 }
 
@@ -54,12 +57,13 @@ char const* NameOf(GLenum error) {
 } // namespace
 
 void GlDebug::Attach(RendererProcLoader loader) {
+    theDebug = this;
     if (!loader || !HasExtension("GL_KHR_debug")) return;
     mObjectLabel = reinterpret_cast<PFNGLOBJECTLABELKHRPROC>(loader("glObjectLabelKHR"));
-    glGetIntegerv(GL_MAX_LABEL_LENGTH_KHR, &mMaxLabelLength);
+    Gl::GetIntegerv(GL_MAX_LABEL_LENGTH_KHR, &mMaxLabelLength);
     // Debug output starts switched on in debug contexts and off in others, and a driver may spend time on
     // messages that nobody asked for.
-    if (glIsEnabled(GL_DEBUG_OUTPUT_KHR)) InstallCallback(loader);
+    if (Gl::IsEnabled(GL_DEBUG_OUTPUT_KHR)) InstallCallback(loader);
 }
 
 void GlDebug::InstallCallback(RendererProcLoader loader) {
@@ -71,12 +75,13 @@ void GlDebug::InstallCallback(RendererProcLoader loader) {
     getPointer(GL_DEBUG_CALLBACK_FUNCTION_KHR, &installed);
     if (installed) return;
     mSetCallback = setCallback;
-    mSetCallback(OnMessage, &mStatistics);
+    mSetCallback(OnMessage, &mCounters);
     // Without it a driver may call from threads of its own, after the call that was at fault.
-    glEnable(GL_DEBUG_OUTPUT_SYNCHRONOUS_KHR);
+    Gl::Enable(GL_DEBUG_OUTPUT_SYNCHRONOUS_KHR);
 }
 
 void GlDebug::Detach() {
+    theDebug = nullptr;
     if (mSetCallback) mSetCallback(nullptr, nullptr);
     mSetCallback = nullptr;
     mObjectLabel = nullptr;
@@ -90,14 +95,14 @@ void GlDebug::Label(GLenum identifier, GLuint name, char const* text) const {
     mObjectLabel(identifier, name, static_cast<GLsizei>(length), text);
 }
 
-bool GlDebug::Check(char const* doing) {
+bool GlDebug::TakeErrors(char const* doing) {
     bool clean = true;
     for (GLenum error = glGetError(); error != GL_NO_ERROR; error = glGetError()) {
         // A lost context reports its loss for ever.
         constexpr GLenum kContextLost = 0x0507;
         clean = false;
         if (!mSetCallback) {
-            ++mStatistics.errors;
+            ++mCounters.errors;
             __android_log_print(ANDROID_LOG_ERROR, "mok_log", "GL error 0x%04x (%s) %s", error, NameOf(error),
                                 doing);
         }
@@ -105,5 +110,21 @@ bool GlDebug::Check(char const* doing) {
     }
     return clean;
 }
+
+bool GlDebug::Check(char const* doing) {
+    bool const isClean = TakeErrors(doing) && !mCallFailed;
+    mCallFailed = false;
+    return isClean;
+}
+
+void GlDebug::CheckCall(char const* call) {
+    if (!TakeErrors(call)) mCallFailed = true;
+}
+
+#if defined(MOKA_CHECKS) && MOKA_CHECKS
+void CheckGlCall(char const* call) {
+    if (theDebug) theDebug->CheckCall(call);
+}
+#endif
 
 } // namespace Moka::detail

@@ -5,17 +5,17 @@
 
 #include "moka/renderer/RendererFactory.h"
 
-#include <GLES3/gl3.h>
+#include "moka/renderer/gles/GlFunctions.h"
 // The prototypes of extensions come after the core header.
 #include <GLES2/gl2ext.h>
 
 namespace Moka::detail {
 
-struct GlStatistics;
+struct Counters;
 
 class GlDebug {
 public:
-    explicit GlDebug(GlStatistics& statistics) : mStatistics(statistics) {}
+    explicit GlDebug(Counters& counters) : mCounters(counters) {}
 
     // In a debug context whose owner has not set a callback, messages of error severity go to the log and
     // into the statistics.
@@ -25,18 +25,22 @@ public:
     // identifier: GL_TEXTURE and so on. Longer labels than the driver takes are cut.
     void Label(GLenum identifier, GLuint name, char const* text) const;
 
-    // Takes the pending GL errors; false when there were any. They are logged with what was being done, and
+    // Takes the pending GL errors; false when there were any since the last check. They are logged with what was being done, and
     // counted, unless the driver's own message has been already. For places where the call costs nothing
     // beside the work, never for a draw.
     bool Check(char const* doing);
+    // The same after one call, in debug builds; see GlFunctions.h.
+    void CheckCall(char const* call);
 
 private:
     void InstallCallback(RendererProcLoader loader);
+    bool TakeErrors(char const* doing);
 
-    GlStatistics& mStatistics;
+    Counters& mCounters;
     PFNGLOBJECTLABELKHRPROC mObjectLabel = nullptr;
     PFNGLDEBUGMESSAGECALLBACKKHRPROC mSetCallback = nullptr; // null: none of ours is installed
     GLint mMaxLabelLength = 0;
+    bool mCallFailed = false; // since the last check
 };
 
 } // namespace Moka::detail

@@ -2,7 +2,6 @@
 
 #include "moka/renderer/gles/GlTables.h"
 
-#include <algorithm>
 #include <limits>
 
 namespace Moka::detail {
@@ -26,33 +25,12 @@ private:
 };
 
 void Upload(GLint x, GLint y, GLsizei width, GLsizei height, void const* pixels) {
-    glTexSubImage2D(GL_TEXTURE_2D, 0, x, y, width, height, kGlFormat, kGlType, pixels);
+    Gl::TexSubImage2D(GL_TEXTURE_2D, 0, x, y, width, height, kGlFormat, kGlType, pixels);
 }
 
 } // namespace
 
-std::size_t GlBlock::GetBytes() const {
-    return static_cast<std::size_t>(width) * static_cast<std::size_t>(height) * kBytesPerPixel;
-}
-
-GlBlock GlBlock::Clip(std::int64_t x, std::int64_t y, std::int64_t width, std::int64_t height,
-                      GLsizei imageWidth, GLsizei imageHeight) {
-    std::int64_t const left = std::max<std::int64_t>(x, 0);
-    std::int64_t const top = std::max<std::int64_t>(y, 0);
-    std::int64_t const right = std::min<std::int64_t>(x + width, imageWidth);
-    std::int64_t const bottom = std::min<std::int64_t>(y + height, imageHeight);
-    if (right <= left || bottom <= top) return {};
-    GlBlock block;
-    block.x = static_cast<GLint>(left);
-    block.y = static_cast<GLint>(top);
-    block.width = static_cast<GLsizei>(right - left);
-    block.height = static_cast<GLsizei>(bottom - top);
-    block.skippedRows = static_cast<std::ptrdiff_t>(top - y);
-    block.skippedPixels = static_cast<std::ptrdiff_t>(left - x);
-    return block;
-}
-
-void UploadPixels(GlState& state, GlBlock const& block, void const* pixels, std::int64_t stride) {
+void UploadPixels(GlState& state, PixelBlock const& block, void const* pixels, std::int64_t stride) {
     auto const* row = static_cast<unsigned char const*>(pixels) + block.skippedRows * stride +
                       block.skippedPixels * kBytesPerPixel;
     std::int64_t const rowLength = stride / kBytesPerPixel;
@@ -67,11 +45,11 @@ void UploadPixels(GlState& state, GlBlock const& block, void const* pixels, std:
         Upload(block.x, block.y + y, block.width, 1, row);
 }
 
-void ReadBackPixels(GlState& state, GlBlock const& block, void* pixels, GLint rowLength) {
+void ReadBackPixels(GlState& state, PixelBlock const& block, void* pixels, GLint rowLength) {
     auto* const first = static_cast<unsigned char*>(pixels) +
                         (block.skippedRows * rowLength + block.skippedPixels) * kBytesPerPixel;
     GlPixelStoreScope const store(state.pack, rowLength);
-    glReadPixels(block.x, block.y, block.width, block.height, kGlFormat, kGlType, first);
+    Gl::ReadPixels(block.x, block.y, block.width, block.height, kGlFormat, kGlType, first);
 }
 
 } // namespace Moka::detail

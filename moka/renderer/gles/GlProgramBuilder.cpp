@@ -1,8 +1,7 @@
 #include "moka/renderer/gles/GlProgramBuilder.h"
 
 #include "moka/base/log/AndroidLog.h"
-#include "moka/renderer/gles/GlContext.h"
-#include "moka/renderer/gles/GlslDeclarations.h"
+#include "moka/renderer/device/GlslDeclarations.h"
 
 #include <string>
 
@@ -26,12 +25,12 @@ std::string ReadLog(GLint length, Query query) {
 
 class ShaderStage {
 public:
-    ShaderStage(GLenum kind, char const* source) : mName(glCreateShader(kind)) {
+    ShaderStage(GLenum kind, char const* source) : mName(Gl::CreateShader(kind)) {
         char const* const text = source ? source : "";
-        glShaderSource(mName, 1, &text, nullptr);
-        glCompileShader(mName);
+        Gl::ShaderSource(mName, 1, &text, nullptr);
+        Gl::CompileShader(mName);
     }
-    ~ShaderStage() { glDeleteShader(mName); }
+    ~ShaderStage() { Gl::DeleteShader(mName); }
     ShaderStage(ShaderStage const&) = delete;
     ShaderStage& operator=(ShaderStage const&) = delete;
 
@@ -39,15 +38,15 @@ public:
 
     bool IsCompiled() const {
         GLint compiled = GL_FALSE;
-        glGetShaderiv(mName, GL_COMPILE_STATUS, &compiled);
+        Gl::GetShaderiv(mName, GL_COMPILE_STATUS, &compiled);
         return compiled == GL_TRUE;
     }
 
     std::string GetLog() const {
         GLint length = 0;
-        glGetShaderiv(mName, GL_INFO_LOG_LENGTH, &length);
+        Gl::GetShaderiv(mName, GL_INFO_LOG_LENGTH, &length);
         return ReadLog(length, [this](GLsizei size, GLsizei* written, GLchar* text) {
-            glGetShaderInfoLog(mName, size, written, text);
+            Gl::GetShaderInfoLog(mName, size, written, text);
         });
     }
 
@@ -63,16 +62,16 @@ int CountLocations(std::string const& type) {
 void BindAttributes(GLuint program, char const* vertexSource) {
     GLuint location = 0;
     for (GlslDeclaration const& attribute : FindGlslDeclarations(vertexSource, {"attribute", "in"})) {
-        glBindAttribLocation(program, location, attribute.name.c_str());
+        Gl::BindAttribLocation(program, location, attribute.name.c_str());
         location += static_cast<GLuint>(CountLocations(attribute.type));
     }
 }
 
 std::string GetProgramLog(GLuint program) {
     GLint length = 0;
-    glGetProgramiv(program, GL_INFO_LOG_LENGTH, &length);
+    Gl::GetProgramiv(program, GL_INFO_LOG_LENGTH, &length);
     return ReadLog(length, [program](GLsizei size, GLsizei* written, GLchar* text) {
-        glGetProgramInfoLog(program, size, written, text);
+        Gl::GetProgramInfoLog(program, size, written, text);
     });
 }
 
@@ -85,35 +84,31 @@ GLuint Link(char const* vertexSource, char const* fragmentSource, std::string* f
         *failure = std::string("the ") + what + " stage does not compile: " + stage->GetLog();
         return 0;
     }
-    GLuint const program = glCreateProgram();
-    glAttachShader(program, vertex.GetName());
-    glAttachShader(program, fragment.GetName());
+    GLuint const program = Gl::CreateProgram();
+    Gl::AttachShader(program, vertex.GetName());
+    Gl::AttachShader(program, fragment.GetName());
     BindAttributes(program, vertexSource);
-    glLinkProgram(program);
-    glDetachShader(program, vertex.GetName());
-    glDetachShader(program, fragment.GetName());
+    Gl::LinkProgram(program);
+    Gl::DetachShader(program, vertex.GetName());
+    Gl::DetachShader(program, fragment.GetName());
     GLint linked = GL_FALSE;
-    glGetProgramiv(program, GL_LINK_STATUS, &linked);
+    Gl::GetProgramiv(program, GL_LINK_STATUS, &linked);
     if (linked == GL_TRUE) return program;
     *failure = "the stages do not link: " + GetProgramLog(program);
-    glDeleteProgram(program);
+    Gl::DeleteProgram(program);
     return 0;
 }
 
 } // namespace
 
-GlBuiltProgram BuildGlProgram(GlContext& context, char const* vertexSource, char const* fragmentSource,
-                              char const* name) {
+GLuint BuildGlProgram(char const* vertexSource, char const* fragmentSource, char const* label, bool* draws) {
     std::string failure;
-    GlBuiltProgram program{Link(vertexSource, fragmentSource, &failure), false};
-    if (program.name == 0) {
-        ++context.statistics.errors;
-        __android_log_print(ANDROID_LOG_ERROR, "mok_log",
-                            "RendererFactory::CreateShaderProgram: %s draws nothing: %s", name,
-                            failure.c_str());
-        program = {Link(kVertexOutside, kFragmentNever, &failure), true};
-    }
-    return program;
+    GLuint const program = Link(vertexSource, fragmentSource, &failure);
+    *draws = program != 0;
+    if (*draws) return program;
+    __android_log_print(ANDROID_LOG_ERROR, "mok_log",
+                        "RendererFactory::CreateShaderProgram: %s draws nothing: %s", label, failure.c_str());
+    return Link(kVertexOutside, kFragmentNever, &failure);
 }
 
 } // namespace Moka::detail

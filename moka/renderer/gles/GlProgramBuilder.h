@@ -2,20 +2,13 @@
 // Thread: render thread, inside an operation.
 #pragma once
 
-#include <GLES3/gl3.h>
+#include "moka/renderer/gles/GlFunctions.h"
 
 namespace Moka::detail {
 
-class GlContext;
-
-struct GlBuiltProgram {
-    GLuint name = 0; // 0 only when the driver makes no program at all
-    bool isPlaceholder = false;
-};
-
 // Attributes get their locations in the order of their declaration. A pair that does not compile or link is
-// reported with one error line, and a placeholder that draws nothing takes its place.
-GlBuiltProgram BuildGlProgram(GlContext& context, char const* vertexSource, char const* fragmentSource,
-                              char const* name);
+// logged with the driver's text, and a placeholder that draws nothing takes its place (draws is false). 0 only
+// when the driver makes no program at all.
+GLuint BuildGlProgram(char const* vertexSource, char const* fragmentSource, char const* label, bool* draws);
 
 } // namespace Moka::detail

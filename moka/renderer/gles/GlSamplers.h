@@ -1,46 +1,33 @@
-// GlSamplers: one GL sampler object for each sampling state in use, made when first asked for. Texture
-// objects with the same state share it, so that changing a parameter back and forth makes nothing new.
+// GlSamplers: one GL sampler object for each sampling state in use, made when it is first needed. Textures with
+// equal states share it, so that changing a parameter back and forth makes nothing new.
 // Thread: render thread.
 #pragma once
 
-#include <GLES3/gl3.h>
+#include "moka/renderer/device/DrawState.h"
+#include "moka/renderer/gles/GlFunctions.h"
 
 #include <vector>
 
 namespace Moka::detail {
 
 class GlState;
-struct GlStatistics;
-
-struct GlSampling {
-    GLenum minFilter = GL_LINEAR;
-    GLenum magFilter = GL_LINEAR;
-    GLenum wrapS = GL_CLAMP_TO_EDGE;
-    GLenum wrapT = GL_CLAMP_TO_EDGE;
-
-    friend bool operator==(GlSampling const& a, GlSampling const& b) {
-        return a.minFilter == b.minFilter && a.magFilter == b.magFilter && a.wrapS == b.wrapS &&
-               a.wrapT == b.wrapT;
-    }
-};
 
 class GlSamplers {
 public:
-    GlSamplers(GlState& state, GlStatistics& statistics) : mState(state), mStatistics(statistics) {}
+    explicit GlSamplers(GlState& state) : mState(state) {}
 
     // Valid until Clear().
-    GLuint Get(GlSampling const& sampling);
+    GLuint Get(Sampling const& sampling);
     void Clear();
 
 private:
     struct Entry {
-        GlSampling sampling;
+        Sampling sampling;
         GLuint name;
     };
 
     GlState& mState;
-    GlStatistics& mStatistics;
-    std::vector<Entry> mEntries; // at most one for each of the 36 states, mostly two or three
+    std::vector<Entry> mEntries; // few: filters and wraps have 36 combinations
 };
 
 } // namespace Moka::detail

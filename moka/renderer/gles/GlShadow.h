@@ -5,7 +5,7 @@
 // Thread: render thread.
 #pragma once
 
-#include "moka/renderer/gles/GlStatistics.h"
+#include "moka/renderer/device/Counters.h"
 
 #include <optional>
 
@@ -16,12 +16,12 @@ class GlShadow {
 public:
     using Value = typename Access::Value;
 
-    explicit GlShadow(GlStatistics& statistics) : mStatistics(statistics) {}
+    explicit GlShadow(Counters& counters) : mCounters(counters) {}
 
     Value const& Get() {
         if (!mValue) {
             mValue = Access::Query();
-            ++mStatistics.queries;
+            ++mCounters.queries;
         }
         return *mValue;
     }
@@ -40,7 +40,7 @@ public:
     Value* Known() { return mValue ? &*mValue : nullptr; }
 
 private:
-    GlStatistics& mStatistics;
+    Counters& mCounters;
     std::optional<Value> mValue;
 };
 

@@ -1,122 +1,23 @@
-// GlState: the shadow of the GL state that the renderer sets or depends on, one small value a concept.
+// GlState: the cache of the actual GL state, one value for each part that the renderer sets or depends on.
+// Redundant calls are not made. What the host had before is GlHostState's.
 // Thread: render thread.
-// Does not know what the state is for: who draws where is GlTargetSwitch's business.
 #pragma once
 
-#include "moka/renderer/IRasterizerState.h"
-#include "moka/renderer/gles/GlDrawAccess.h"
-#include "moka/renderer/gles/GlPixelStore.h"
+#include "moka/renderer/device/DrawState.h"
 #include "moka/renderer/gles/GlShadow.h"
+#include "moka/renderer/gles/GlStateValues.h"
 
-#include <GLES3/gl3.h>
 
 #include <vector>
 
-namespace Moka {
-class BlendStateDescriptor;
-class DepthStencilStateDescriptor;
-} // namespace Moka
-
 namespace Moka::detail {
 
-struct GlStatistics;
-
-struct GlFrameBuffersAccess {
-    struct Value {
-        GLuint draw;
-        GLuint read;
-        friend bool operator==(Value const& a, Value const& b) {
-            return a.draw == b.draw && a.read == b.read;
-        }
-    };
-    static Value Query();
-    static void Apply(Value const& value, Value const* known);
-};
-using GlFrameBuffers = GlFrameBuffersAccess::Value;
-
-// In pixels of the frame buffer, from GL's origin.
-struct GlBox {
-    GLint x = 0, y = 0, width = 0, height = 0;
-    friend bool operator==(GlBox const& a, GlBox const& b) {
-        return a.x == b.x && a.y == b.y && a.width == b.width && a.height == b.height;
-    }
-};
-
-struct GlViewportAccess {
-    using Value = GlBox;
-    static Value Query();
-    static void Apply(Value const& value, Value const* known);
-};
-
-struct GlScissorRectAccess {
-    using Value = GlBox;
-    static Value Query();
-    static void Apply(Value const& value, Value const* known);
-};
-
-struct GlScissorTestAccess {
-    using Value = bool;
-    static Value Query();
-    static void Apply(Value value, Value const* known);
-};
-
-struct GlColorMaskAccess {
-    struct Value {
-        GLboolean r, g, b, a;
-        friend bool operator==(Value const& x, Value const& y) {
-            return x.r == y.r && x.g == y.g && x.b == y.b && x.a == y.a;
-        }
-    };
-    static Value Query();
-    static void Apply(Value const& value, Value const* known);
-};
-inline constexpr GlColorMaskAccess::Value kGlAllColors{GL_TRUE, GL_TRUE, GL_TRUE, GL_TRUE};
-
-// The write masks of depth and of both faces' stencil.
-struct GlDepthStencilMaskAccess {
-    struct Value {
-        GLboolean depth;
-        GLuint front, back;
-        friend bool operator==(Value const& x, Value const& y) {
-            return x.depth == y.depth && x.front == y.front && x.back == y.back;
-        }
-    };
-    static Value Query();
-    static void Apply(Value const& value, Value const* known);
-};
-inline constexpr GlDepthStencilMaskAccess::Value kGlAllDepthStencil{GL_TRUE, 0xFFu, 0xFFu};
-
-// What must be off for everything the renderer does, a bit for each that is on: nothing is culled, dithered,
-// offset, covered by samples, or thrown away before the rasterizer, nor tested for depth unless a state asks.
-struct GlObstaclesAccess {
-    using Value = unsigned;
-    static constexpr Value kDepthTest = 1u;
-    static Value Query();
-    static void Apply(Value value, Value const* known);
-};
-
-struct GlActiveUnitAccess {
-    using Value = int;
-    static Value Query();
-    static void Apply(Value value, Value const* known);
-};
-
-struct GlRenderBufferAccess {
-    using Value = GLuint;
-    static Value Query();
-    static void Apply(Value value, Value const* known);
-};
-
-struct GlProgramAccess {
-    using Value = GLuint;
-    static Value Query();
-    static void Apply(Value value, Value const* known);
-};
+struct Counters;
 
 class GlState {
 public:
     // Reads the number of texture units from the current context.
-    explicit GlState(GlStatistics& statistics);
+    explicit GlState(Counters& counters);
 
     // Somebody else may have changed anything.
     void Invalidate();
@@ -124,28 +25,29 @@ public:
     // What a draw is made under; each counts what it changes.
     void SetScissorTest(bool on);
     void SetScissorRect(GlBox const& box);
+    // The rectangle only while the test is on.
+    void SetScissor(ScissorState const& scissor);
     void SetBlend(BlendStateDescriptor const& blend);
     void SetDepthStencil(DepthStencilStateDescriptor const& depthStencil);
-    void SetProgram(GLuint name);
 
-    GlStatistics& statistics;
+    Counters& counters;
 
-    GlShadow<GlFrameBuffersAccess> frameBuffers{statistics};
-    GlShadow<GlViewportAccess> viewport{statistics};
-    GlShadow<GlScissorTestAccess> scissorTest{statistics};
-    GlShadow<GlScissorRectAccess> scissorRect{statistics};
-    GlShadow<GlColorMaskAccess> colorMask{statistics};
-    GlShadow<GlDepthStencilMaskAccess> depthStencilMask{statistics};
-    GlShadow<GlObstaclesAccess> obstacles{statistics};
-    GlShadow<GlActiveUnitAccess> activeUnit{statistics};
-    GlShadow<GlRenderBufferAccess> renderBuffer{statistics};
-    GlShadow<GlProgramAccess> program{statistics};
-    GlShadow<GlBlendAccess> blend{statistics};
-    GlShadow<GlStencilAccess> stencil{statistics};
-    GlShadow<GlVertexArrayAccess> vertexArray{statistics};
-    GlShadow<GlArrayBufferAccess> arrayBuffer{statistics};
-    GlShadow<GlPixelStoreAccess<GlUnpackNames>> unpack{statistics};
-    GlShadow<GlPixelStoreAccess<GlPackNames>> pack{statistics};
+    GlShadow<GlFrameBuffersAccess> frameBuffers{counters};
+    GlShadow<GlViewportAccess> viewport{counters};
+    GlShadow<GlScissorTestAccess> scissorTest{counters};
+    GlShadow<GlScissorRectAccess> scissorRect{counters};
+    GlShadow<GlColorMaskAccess> colorMask{counters};
+    GlShadow<GlDepthStencilMaskAccess> depthStencilMask{counters};
+    GlShadow<GlObstaclesAccess> obstacles{counters};
+    GlShadow<GlActiveUnitAccess> activeUnit{counters};
+    GlShadow<GlRenderBufferAccess> renderBuffer{counters};
+    GlShadow<GlProgramAccess> program{counters};
+    GlShadow<GlBlendAccess> blend{counters};
+    GlShadow<GlStencilAccess> stencil{counters};
+    GlShadow<GlVertexArrayAccess> vertexArray{counters};
+    GlShadow<GlArrayBufferAccess> arrayBuffer{counters};
+    GlShadow<GlPixelStoreAccess<GlUnpackNames>> unpack{counters};
+    GlShadow<GlPixelStoreAccess<GlPackNames>> pack{counters};
 
     // Units for sampling are 0 up to this number. The one after them is kept for uploads and copies, so that
     // what foreign code and draws have bound stays bound.
@@ -161,8 +63,6 @@ public:
     void ForgetVertexArray(GLuint name);
     void ForgetArrayBuffer(GLuint name);
     void ForgetFrameBuffer(GLuint frameBuffer);
-    // Ahead of its deletion, which a current program survives.
-    void TakeOffProgram(GLuint name);
 
 private:
     friend class GlEditTexture;

@@ -1,7 +1,7 @@
 #include "moka/renderer/gles/GlVertexFormats.h"
 
 #include "moka/renderer/gles/GlState.h"
-#include "moka/renderer/gles/GlStatistics.h"
+#include "moka/renderer/device/Counters.h"
 
 #include <cstdint>
 
@@ -18,13 +18,13 @@ int GlVertexFormats::Find(VertexDescriptor const& descriptor) {
 // A whole new store each time, so that the driver need not wait for the draws that read the old one.
 void GlVertexFormats::Upload(std::vector<GLfloat> const& vertices) {
     if (mBuffer == 0) {
-        glGenBuffers(1, &mBuffer);
-        ++mState.statistics.buffers;
+        Gl::GenBuffers(1, &mBuffer);
+        ++mState.counters.buffers;
     }
     std::size_t const bytes = vertices.size() * sizeof(GLfloat);
     mState.arrayBuffer.Set(mBuffer);
-    glBufferData(GL_ARRAY_BUFFER, static_cast<GLsizeiptr>(bytes), vertices.data(), GL_STREAM_DRAW);
-    mState.statistics.vertexBytes += bytes;
+    Gl::BufferData(GL_ARRAY_BUFFER, static_cast<GLsizeiptr>(bytes), vertices.data(), GL_STREAM_DRAW);
+    mState.counters.vertexBytes += bytes;
 }
 
 void GlVertexFormats::Bind(int format) {
@@ -37,8 +37,8 @@ void GlVertexFormats::Bind(int format) {
 }
 
 void GlVertexFormats::MakeVertexArray(Format& format) {
-    glGenVertexArrays(1, &format.vertexArray);
-    ++mState.statistics.buffers;
+    Gl::GenVertexArrays(1, &format.vertexArray);
+    ++mState.counters.buffers;
     mState.vertexArray.Set(format.vertexArray);
     mState.arrayBuffer.Set(mBuffer);
     VertexDescriptor const& descriptor = format.descriptor;
@@ -47,9 +47,9 @@ void GlVertexFormats::MakeVertexArray(Format& format) {
     for (int i = 0; i < descriptor.GetAttributeCount(); ++i) {
         int const components = descriptor.GetAttribute(i).components;
         auto const location = static_cast<GLuint>(i);
-        glEnableVertexAttribArray(location);
+        Gl::EnableVertexAttribArray(location);
         auto const* const pointer = reinterpret_cast<void const*>(offset);
-        glVertexAttribPointer(location, components, GL_FLOAT, GL_FALSE, stride, pointer);
+        Gl::VertexAttribPointer(location, components, GL_FLOAT, GL_FALSE, stride, pointer);
         offset += static_cast<std::uintptr_t>(components) * sizeof(GLfloat);
     }
 }
@@ -58,15 +58,15 @@ void GlVertexFormats::Clear() {
     for (Format& format : mFormats) {
         if (format.vertexArray == 0) continue;
         mState.ForgetVertexArray(format.vertexArray);
-        glDeleteVertexArrays(1, &format.vertexArray);
-        --mState.statistics.buffers;
+        Gl::DeleteVertexArrays(1, &format.vertexArray);
+        --mState.counters.buffers;
     }
     mFormats.clear();
     if (mBuffer == 0) return;
     mState.ForgetArrayBuffer(mBuffer);
-    glDeleteBuffers(1, &mBuffer);
+    Gl::DeleteBuffers(1, &mBuffer);
     mBuffer = 0;
-    --mState.statistics.buffers;
+    --mState.counters.buffers;
 }
 
 } // namespace Moka::detail

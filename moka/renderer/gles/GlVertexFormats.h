@@ -1,11 +1,10 @@
-// GlVertexFormats: one vertex array for each layout of vertices in use, all over one buffer that every play
+// GlVertexFormats: one vertex array for each layout of vertices in use, all over one buffer that every submission
 // fills anew.
 // Thread: render thread.
 #pragma once
 
 #include "moka/renderer/VertexDescriptor.h"
-
-#include <GLES3/gl3.h>
+#include "moka/renderer/gles/GlFunctions.h"
 
 #include <vector>
 

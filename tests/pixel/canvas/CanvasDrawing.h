@@ -25,8 +25,8 @@ struct Drawing {
 };
 
 enum class Way {
-    Deferred,    // a caller-side canvas; the renderer plays its list when the queue is empty
-    Immediate,   // a caller-side canvas; the renderer plays every draw
+    Deferred,    // a caller-side canvas; the renderer flushes its list when the queue is empty
+    Immediate,   // a caller-side canvas; the renderer flushes every draw
     RenderThread // a render-thread canvas, drawn on there
 };
 

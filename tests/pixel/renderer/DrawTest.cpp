@@ -131,7 +131,7 @@ TEST_P(DrawTest, AFullListIsPlayedAndALaterFrameAsksNothingAndGrowsNothing) {
     EXPECT_EQ(after.listBytes, before.listBytes);
     EXPECT_LT(after.listBytes, 8u << 20);
     EXPECT_EQ(after.buffers, before.buffers);
-    EXPECT_GT(after.plays, before.plays + 1);
+    EXPECT_GT(after.flushes, before.flushes + 1);
     // The host's frame buffer, viewport, vertex input and obstacles, once a frame at most.
     EXPECT_LE(after.queries - before.queries, IsDeferred() ? 0u : 8u);
     EXPECT_EQ(after.frameBufferSwitches - before.frameBufferSwitches, 2u);

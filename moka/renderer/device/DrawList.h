@@ -1,0 +1,73 @@
+// DrawList: draws, clears and copies in order, as values that a device submits to GL. Plain data: record/
+// fills it (DrawListBuilder), Device::Submit reads it.
+#pragma once
+
+#include "moka/renderer/device/DrawState.h"
+
+#include <variant>
+#include <vector>
+
+namespace Moka::detail {
+
+// Adjacent draws with one state and one set of uniform values: one draw call.
+struct Run {
+    std::size_t state;    // index into the list's states
+    std::size_t uniforms; // offset of the program's values into the list's uniforms, bytes
+    int first;            // vertex, counted in vertices of the run's own format
+    int count;            // vertices
+};
+
+// Ignores blending and the colour mask. So does DepthStencilClear with the write masks.
+struct ColorClear {
+    TargetRef target;
+    ScissorState scissor;
+    std::array<float, 4> color;
+};
+
+// Makes a new texture transparent. Changes no state that a draw depends on.
+struct TextureClear {
+    TargetRef target;
+};
+
+struct DepthStencilClear {
+    TargetRef target;
+    ScissorState scissor;
+    bool clearDepth;
+    bool clearStencil;
+    float depth;
+    int stencil;
+};
+
+// The contents are no longer needed.
+struct Discard {
+    TargetRef target;
+    bool color;
+    bool depthStencil;
+};
+
+// The first rows and columns of from into the texture of to, without a flip: width x height pixels. A source
+// without alpha reads as opaque. to.frameBuffer exists where from is a host's frame buffer; elsewhere it is 0.
+struct TargetCopy {
+    TargetRef from;
+    TargetRef to;
+    int width;
+    int height;
+};
+
+// The texels of from into the first rows and columns of to, whatever the scissor and the masks are.
+struct TextureDraw {
+    TargetRef from;
+    TargetRef to;
+};
+
+using Command =
+    std::variant<Run, ColorClear, DepthStencilClear, TextureClear, Discard, TargetCopy, TextureDraw>;
+
+struct DrawList {
+    std::vector<Command> commands;
+    std::vector<DrawState> states;
+    std::vector<unsigned char> uniforms;
+    std::vector<float> vertices;
+};
+
+} // namespace Moka::detail

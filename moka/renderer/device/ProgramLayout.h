@@ -1,0 +1,58 @@
+// ProgramLayout: the uniforms of a linked program and where each value lies in the program's block of values.
+// Values lie in the order of the layout, packed: a bool, an int and a texture unit are 4 bytes, vectors and
+// matrices their floats.
+#pragma once
+
+#include "moka/renderer/IParameterBinding.h"
+#include "moka/renderer/device/DrawState.h"
+
+#include <string>
+#include <vector>
+
+namespace Moka::detail {
+
+// Bytes of one value; 0 for BindingTypeUnknown.
+constexpr std::size_t GetValueSize(BindingType type) {
+    switch (type) {
+    case BindingTypeUnknown:
+        return 0;
+    case BindingTypeMatrix4:
+        return 16 * sizeof(float);
+    case BindingTypeVector2:
+        return 2 * sizeof(float);
+    case BindingTypeVector4:
+        return 4 * sizeof(float);
+    case BindingTypeFloat:
+    case BindingTypeBool:
+    case BindingTypeInt:
+    case BindingTypeTextureUnit:
+        return 4;
+    }
+    return 0;
+}
+
+struct ProgramLayout {
+    struct Uniform {
+        std::string name;
+        BindingType type;
+        std::size_t offset; // bytes
+    };
+
+    // False: the sources do not compile or link. The program then exists and draws nothing.
+    bool draws = false;
+    std::vector<Uniform> uniforms;
+    std::vector<std::size_t> samplers; // indices of uniforms, at most kMaxSamplers
+    std::size_t size = 0;              // bytes of all values
+
+    bool HasRoomFor(BindingType type) const {
+        return type != BindingTypeTextureUnit || samplers.size() < kMaxSamplers;
+    }
+
+    void Add(char const* name, BindingType type) {
+        if (type == BindingTypeTextureUnit) samplers.push_back(uniforms.size());
+        uniforms.push_back({name, type, size});
+        size += GetValueSize(type);
+    }
+};
+
+} // namespace Moka::detail

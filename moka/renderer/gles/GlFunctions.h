@@ -1,0 +1,70 @@
+// GlFunctions.h: every GL function that the renderer calls, as Gl::Name. In debug builds each call is followed
+// by an error check that names it; otherwise Gl::Name is the function itself.
+// Thread: render thread.
+#pragma once
+
+#include <GLES3/gl3.h>
+
+#define MOKA_GL_FUNCTIONS(X)                                                                                 \
+    X(ActiveTexture) X(AttachShader) X(BindAttribLocation) X(BindBuffer) X(BindFramebuffer)                  \
+    X(BindRenderbuffer) X(BindSampler) X(BindTexture) X(BindVertexArray) X(BlendEquation)                    \
+    X(BlendFuncSeparate) X(BlitFramebuffer) X(BufferData) X(CheckFramebufferStatus) X(ClearBufferfi)         \
+    X(ClearBufferfv) X(ClearBufferiv) X(ColorMask) X(CompileShader) X(CopyTexSubImage2D) X(CreateProgram)    \
+    X(CreateShader) X(DeleteBuffers) X(DeleteFramebuffers) X(DeleteProgram) X(DeleteRenderbuffers)           \
+    X(DeleteSamplers) X(DeleteShader) X(DeleteTextures) X(DeleteVertexArrays) X(DepthFunc) X(DepthMask)      \
+    X(DetachShader) X(Disable) X(DrawArrays) X(Enable) X(EnableVertexAttribArray) X(FramebufferRenderbuffer) \
+    X(FramebufferTexture2D) X(GenBuffers) X(GenFramebuffers) X(GenRenderbuffers) X(GenSamplers)              \
+    X(GenTextures) X(GenVertexArrays) X(GetActiveUniform) X(GetBooleanv) X(GetIntegerv)                      \
+    X(GetProgramInfoLog) X(GetProgramiv) X(GetShaderInfoLog) X(GetShaderiv) X(GetString) X(GetStringi)       \
+    X(GetUniformLocation) X(InvalidateFramebuffer) X(IsEnabled) X(LinkProgram) X(PixelStorei) X(ReadPixels)  \
+    X(RenderbufferStorage) X(SamplerParameteri) X(Scissor) X(ShaderSource) X(StencilFunc) X(StencilMask)     \
+    X(StencilMaskSeparate) X(StencilOp) X(TexParameteri) X(TexStorage2D) X(TexSubImage2D) X(Uniform1fv)      \
+    X(Uniform1iv) X(Uniform2fv) X(Uniform4fv) X(UniformMatrix4fv) X(UseProgram) X(VertexAttribPointer)       \
+    X(Viewport)
+
+namespace Moka::detail {
+
+#if defined(MOKA_CHECKS) && MOKA_CHECKS
+
+// Takes the pending errors after a call, logs each with the call's name, and tells the device's GlDebug.
+void CheckGlCall(char const* call);
+
+template <class Function>
+class GlFunction;
+
+template <class Result, class... Arguments>
+class GlFunction<Result(GL_APIENTRY*)(Arguments...)> {
+public:
+    using Pointer = Result(GL_APIENTRY*)(Arguments...);
+
+    constexpr GlFunction(Pointer function, char const* name) : mFunction(function), mName(name) {}
+
+    Result operator()(Arguments... arguments) const {
+        struct Check {
+            char const* const name;
+            ~Check() { CheckGlCall(name); }
+        } const check{mName};
+        return mFunction(arguments...);
+    }
+
+private:
+    Pointer const mFunction;
+    char const* const mName;
+};
+
+#define MOKA_GL_FUNCTION(Name)                                                                               \
+    static constexpr GlFunction<decltype(&::gl##Name)> Name{&::gl##Name, "gl" #Name};
+
+#else
+
+#define MOKA_GL_FUNCTION(Name) static constexpr auto Name = &::gl##Name;
+
+#endif
+
+struct Gl {
+    MOKA_GL_FUNCTIONS(MOKA_GL_FUNCTION)
+};
+
+#undef MOKA_GL_FUNCTION
+
+} // namespace Moka::detail

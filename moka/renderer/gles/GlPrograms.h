@@ -1,0 +1,43 @@
+// GlPrograms: linked programs and the uniform values that GL has for each, so that equal values are sent once.
+// Thread: render thread.
+#pragma once
+
+#include "moka/renderer/device/ProgramLayout.h"
+#include "moka/renderer/gles/GlFunctions.h"
+
+#include <unordered_map>
+#include <vector>
+
+namespace Moka::detail {
+
+class GlState;
+
+class GlPrograms {
+public:
+    explicit GlPrograms(GlState& state) : mState(state) {}
+
+    // Reads the program's uniforms. Those of types that no parameter has are logged by name and left out.
+    void Add(GLuint program, char const* label, ProgramLayout* layout);
+    void Delete(GLuint program);
+
+    // Makes the program current, with these values. A program that failed to link has no values.
+    void Apply(GLuint program, unsigned char const* values);
+
+private:
+    struct Program {
+        ProgramLayout layout;
+        std::vector<GLint> locations; // by uniform
+        std::vector<unsigned char> sent;
+    };
+
+    static void AddUniform(GLuint name, GLuint index, char const* label, Program& program);
+    void Send(Program& program, std::size_t uniform, unsigned char const* values);
+
+    GlState& mState;
+    std::unordered_map<GLuint, Program> mPrograms;
+    // The program applied last, which the next draw uses as well in most cases.
+    GLuint mLastName = 0;
+    Program* mLast = nullptr;
+};
+
+} // namespace Moka::detail

@@ -1,0 +1,37 @@
+// GlSubmitter: makes GL execute a draw list, in order, with as few calls as the state cache allows.
+// Thread: render thread.
+#pragma once
+
+#include "moka/renderer/device/DrawList.h"
+
+namespace Moka::detail {
+
+class GlDevice;
+
+class GlSubmitter {
+public:
+    explicit GlSubmitter(GlDevice& device) : mDevice(device) {}
+
+    void Submit(DrawList const& list);
+
+private:
+    void Execute(Run const& run);
+    void Execute(ColorClear const& clear);
+    void Execute(DepthStencilClear const& clear);
+    void Execute(TextureClear const& clear);
+    void Execute(Discard const& discard);
+    void Execute(TargetCopy const& copy);
+    void Execute(TextureDraw const& draw);
+
+    void Apply(DrawState const& state);
+    void BindForClear(TargetRef const& target);
+    void ClearColor(float const* color);
+    bool HasAlpha(TargetRef const& target);
+    void Blit(TargetRef const& from, TargetRef const& to, int width, int height);
+
+    GlDevice& mDevice;
+    DrawList const* mList = nullptr;
+    DrawState const* mApplied = nullptr; // null after anything but a run
+};
+
+} // namespace Moka::detail

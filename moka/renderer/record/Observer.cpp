@@ -1,0 +1,7 @@
+#include "moka/renderer/record/Observer.h"
+
+namespace Moka::detail {
+
+RecorderObserver* theObserver = nullptr;
+
+} // namespace Moka::detail

@@ -1,0 +1,275 @@
+#include "moka/renderer/record/Recorder.h"
+
+#include "moka/renderer/record/Caps.h"
+#include "moka/renderer/record/GraphicsObject.h"
+#include "moka/renderer/record/ProgramState.h"
+#include "moka/renderer/record/RenderTarget.h"
+#include "moka/renderer/record/TextureStorage.h"
+
+#include <algorithm>
+#include <utility>
+
+namespace Moka::detail {
+
+std::shared_ptr<Recorder> Recorder::Create(RendererLimits const& limits, RendererProcLoader loader) {
+    auto recorder = std::make_shared<Recorder>();
+    recorder->mDevice = MakeDevice(loader, recorder->counters);
+    if (!recorder->mDevice) return nullptr;
+    DeviceCaps const caps = recorder->mDevice->GetCaps();
+    RecorderCaps::Get().Set(caps, limits);
+    recorder->requested.emplace(*recorder->mDevice, caps.samplingUnits);
+    return recorder;
+}
+
+Recorder::~Recorder() = default;
+
+void Recorder::Detach() {
+    MOKA_CHECK(IsRenderThread(), "the renderer is detached on the thread that attached it");
+    mActive = nullptr;
+    FlushForHost();
+    mHolders.clear();
+    fill.Clear(*this);
+    depthStencilPool.Clear();
+    {
+        // A name that another thread drops from here on is not ours to delete any more.
+        std::lock_guard const lock(mDroppedLock);
+        mAttached = false;
+        for (Dropped const& dropped : mDropped) Delete(dropped);
+        mDropped.clear();
+    }
+    requested.reset();
+    mDevice.reset();
+}
+
+void Recorder::Prepare() {
+    bool const isHostsTurn = !mActive && !mIsDeferred;
+    if (isHostsTurn || mIsExternal) {
+        if (!mIsExternal) requested->Forget();
+        mDevice->InvalidateState();
+    }
+    if (mHasDropped && list.IsEmpty()) DeleteDropped();
+}
+
+void Recorder::End() {
+    if (!IsThrough()) return;
+    if (mActive) {
+        StateCommit commit;
+        commit.target = &mActive->GetRef();
+        mDevice->Commit(commit);
+    } else if (!mIsDeferred) {
+        mDevice->RestoreHost(HostState::FrameBuffers);
+    }
+}
+
+bool Recorder::Draw(GraphicsObject& object, int first, int count) {
+    std::shared_ptr<ProgramState> const& program = requested->GetProgram();
+    if (!program || !program->CanDraw()) return false;
+    if (count <= 0) return true;
+    ++counters.drawRequests;
+    // A draw into the host's frame buffer uses the host's viewport, which the next activation takes away.
+    bool const isHosts = !mActive;
+    if (isHosts) {
+        Flush();
+        mDevice->RestoreHost(HostState::All);
+    }
+    DrawState& state = requested->Resolve(GetCurrentTarget(), object.GetFormat(), object.GetPrimitive());
+    if (state.target.texture != 0) SampleCopyOfTarget(state);
+    // Only now: a flush on the way here takes vertices out of the list.
+    list.AddDraw(state, !requested->IsChanged(), *program, object.PlaceVertices(), first, count);
+    requested->SetChanged(false);
+    if (isHosts || mIsExternal || list.IsFull()) Flush();
+    return true;
+}
+
+TargetRef Recorder::GetCurrentTarget() {
+    if (mActive) return mActive->GetRef();
+    TargetRef hosts;
+    hosts.frameBuffer = mDevice->GetHostFrameBuffer();
+    return hosts;
+}
+
+// Sampling the texture that is drawn into is undefined: drivers show the old texels, the new ones, or neither.
+void Recorder::SampleCopyOfTarget(DrawState& state) {
+    for (TextureRef& texture : state.textures) {
+        if (texture.texture != state.target.texture) continue;
+        bool const fits = mTargetCopy && mTargetCopy->GetWidth() == state.target.width &&
+                          mTargetCopy->GetHeight() == state.target.height;
+        if (!fits) {
+            mTargetCopy =
+                TextureStorage::Create(shared_from_this(), state.target.width, state.target.height, {});
+        }
+        if (mTargetCopy) {
+            TargetRef const copy = mTargetCopy->Describe(0);
+            list.Add(TargetCopy{state.target, copy, copy.width, copy.height});
+        }
+        texture.texture = mTargetCopy ? mTargetCopy->GetName() : 0;
+        requested->SetChanged(true);
+    }
+}
+
+void Recorder::AfterAdding() {
+    if (mIsExternal || !mIsDeferred || list.IsFull()) Flush();
+}
+
+void Recorder::Flush() {
+    if (list.IsEmpty()) return;
+    mDevice->Submit(list.GetList());
+    ++counters.flushes;
+    for (GraphicsObject* const holder : mHolders) holder->KeepVertices();
+    mHolders.clear();
+    list.Clear();
+    counters.listBytes.Set(list.GetCapacityBytes());
+    if (mHasDropped) DeleteDropped();
+}
+
+void Recorder::FlushIfUsed(DeviceName texture) {
+    if (list.UsesTexture(texture)) Flush();
+}
+
+void Recorder::RemoveHolder(GraphicsObject const& object) {
+    mHolders.erase(std::remove(mHolders.begin(), mHolders.end(), &object), mHolders.end());
+}
+
+void Recorder::Activate(RenderTarget& target) {
+    // What was drawn into another target is complete before external code sees this one bound.
+    if (!mIsDeferred && mActive != &target) Flush();
+    mActive = &target;
+}
+
+void Recorder::Deactivate(RenderTarget const& target) {
+    if (mActive != &target) return;
+    mActive = nullptr;
+    if (mIsDeferred) return;
+    Flush();
+    CommitStates();
+    mDevice->RestoreHost(HostState::All);
+}
+
+void Recorder::CommitStates() {
+    StateCommit commit;
+    requested->AddStatesTo(commit);
+    mDevice->Commit(commit);
+}
+
+void Recorder::FlushForHost() {
+    if (!Begin()) return;
+    Flush();
+    mTargetCopy.reset();
+    CommitStates();
+    mDevice->RestoreHost(HostState::All);
+}
+
+void Recorder::CommitForExternal() {
+    if (!Begin()) return;
+    Flush();
+    StateCommit commit;
+    requested->AddStatesTo(commit);
+    if (mActive) commit.target = &mActive->GetRef();
+    if (std::shared_ptr<ProgramState> const& program = requested->GetProgram()) {
+        commit.program = program->GetName();
+        commit.values = program->GetValues();
+    }
+    std::vector<TextureRef> const& textures = requested->GetTextures();
+    commit.textures = textures.data();
+    commit.textureCount = textures.size();
+    mDevice->Commit(commit);
+    mDevice->RestoreHost(HostState::VertexInput);
+    mIsExternal = true;
+}
+
+void Recorder::InvalidateState() {
+    mIsExternal = false;
+    if (!Begin()) return;
+    mDevice->InvalidateState();
+    requested->Forget();
+}
+
+void Recorder::SetDeferred(bool on) {
+    if (!Begin()) return;
+    Flush();
+    mIsDeferred = on;
+    if (mActive) return;
+    CommitStates();
+    mDevice->RestoreHost(HostState::All);
+}
+
+void Recorder::Drop(DroppedKind kind, DeviceName name) {
+    if (!mAttached || name == 0) return;
+    if (MayDeleteNow()) {
+        Delete({kind, name});
+        return;
+    }
+    std::lock_guard const lock(mDroppedLock);
+    if (!mAttached) return;
+    mDropped.push_back({kind, name});
+    mHasDropped = true;
+}
+
+void Recorder::DropProgram(ProgramState const& program, DeviceName name) {
+    if (mAttached && IsRenderThread() && requested->GetProgram().get() == &program) {
+        requested->SetProgram(nullptr);
+    }
+    Drop(DroppedKind::Program, name);
+}
+
+void Recorder::DropTextureObject() {
+    bool const isLast = --counters.textureObjects == 0;
+    if (!isLast || !mAttached) return;
+    if (MayDeleteNow()) {
+        mDevice->DeleteSamplers();
+    } else {
+        mHasDropped = true;
+    }
+}
+
+void Recorder::Delete(Dropped const& dropped) {
+    switch (dropped.kind) {
+    case DroppedKind::Texture:
+        list.ForgetTexture(dropped.name);
+        mDevice->DeleteTexture(dropped.name);
+        --counters.textures;
+        return;
+    case DroppedKind::FrameBuffer:
+        mDevice->DeleteFrameBuffer(dropped.name);
+        --counters.frameBuffers;
+        return;
+    case DroppedKind::Program:
+        mDevice->DeleteProgram(dropped.name);
+        --counters.programs;
+        return;
+    }
+}
+
+void Recorder::DeleteDropped() {
+    std::vector<Dropped> dropped;
+    {
+        std::lock_guard const lock(mDroppedLock);
+        dropped.swap(mDropped);
+        mHasDropped = false;
+    }
+    for (Dropped const& one : dropped) Delete(one);
+    if (counters.textureObjects == 0) mDevice->DeleteSamplers();
+}
+
+namespace {
+
+std::mutex theRecorderLock;
+std::shared_ptr<Recorder> theRecorder;
+std::atomic<Recorder*> theAttached{nullptr};
+
+} // namespace
+
+std::shared_ptr<Recorder> GetRecorder() {
+    std::lock_guard const lock(theRecorderLock);
+    return theRecorder;
+}
+
+Recorder* GetAttachedRecorder() { return theAttached; }
+
+void SetRecorder(std::shared_ptr<Recorder> recorder) {
+    std::lock_guard const lock(theRecorderLock);
+    theRecorder = std::move(recorder);
+    theAttached = theRecorder && theRecorder->IsAttached() ? theRecorder.get() : nullptr;
+}
+
+} // namespace Moka::detail

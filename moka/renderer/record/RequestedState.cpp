@@ -1,0 +1,118 @@
+#include "moka/renderer/record/RequestedState.h"
+
+#include "moka/renderer/device/Device.h"
+#include "moka/renderer/record/ProgramState.h"
+#include "moka/renderer/record/TextureStorage.h"
+
+#include <algorithm>
+#include <utility>
+
+namespace Moka::detail {
+
+RequestedState::RequestedState(Device& device, int samplingUnits)
+    : mDevice(device), mUnits(static_cast<std::size_t>(samplingUnits)) {
+    mBound.reserve(mUnits.size());
+}
+
+void RequestedState::SetScissorEnabled(bool on) {
+    mKnowsScissorTest = true;
+    Change(mDraw.scissor.on, on);
+}
+
+void RequestedState::SetScissorRect(ScissorRect const& rect) {
+    mKnowsScissorRect = true;
+    Change(mDraw.scissor.rect, {rect.x, rect.y, std::max(rect.width, 0), std::max(rect.height, 0)});
+}
+
+bool RequestedState::IsScissorEnabled() {
+    if (!mKnowsScissorTest) SetScissorEnabled(mDevice.QueryScissorTest());
+    return mDraw.scissor.on;
+}
+
+ScissorRect const& RequestedState::GetScissorRect() {
+    if (!mKnowsScissorRect) SetScissorRect(mDevice.QueryScissorRect());
+    return mDraw.scissor.rect;
+}
+
+// While the test is off, the rectangle is not queried.
+ScissorState const& RequestedState::GetScissor() {
+    if (IsScissorEnabled()) GetScissorRect();
+    return mDraw.scissor;
+}
+
+void RequestedState::SetBlend(BlendStateDescriptor const& blend) {
+    mKnowsBlend = true;
+    Change(mDraw.blend, blend);
+}
+
+void RequestedState::SetDepthStencil(DepthStencilStateDescriptor const& depthStencil) {
+    if (mStencilClip && !depthStencil.IsStencil()) return;
+    mKnowsDepthStencil = true;
+    Change(mDraw.depthStencil, depthStencil);
+}
+
+void RequestedState::SetProgram(std::shared_ptr<ProgramState> program) {
+    if (mProgram == program) return;
+    mProgram = std::move(program);
+    mChanged = true;
+}
+
+void RequestedState::SetTexture(int unit, std::shared_ptr<TextureStorage> const& storage,
+                                Sampling const& sampling) {
+    mUnits[static_cast<std::size_t>(unit)] = {storage, sampling};
+}
+
+DrawState& RequestedState::Resolve(TargetRef const& target, int format, PrimitiveType primitive) {
+    if (!mKnowsScissorTest || (mDraw.scissor.on && !mKnowsScissorRect)) GetScissor();
+    Change(mDraw.target, target);
+    Change(mDraw.format, format);
+    Change(mDraw.primitive, primitive);
+    Change(mDraw.program, mProgram->GetName());
+    if (mSamples || mProgram->GetSamplerCount() > 0) ResolveTextures();
+    return mDraw;
+}
+
+TextureRef RequestedState::GetTexture(int unit) const {
+    TextureRef texture;
+    texture.unit = unit;
+    if (unit < 0 || unit >= GetUnitCount()) return texture;
+    Unit const& bound = mUnits[static_cast<std::size_t>(unit)];
+    if (std::shared_ptr<TextureStorage> const storage = bound.storage.lock()) {
+        texture.texture = storage->GetName();
+        texture.sampling = bound.sampling;
+    }
+    return texture;
+}
+
+// A unit that the program names and that has nothing bound samples what GL has there.
+void RequestedState::ResolveTextures() {
+    std::size_t const count = mProgram->GetSamplerCount();
+    for (std::size_t i = 0; i < kMaxSamplers; ++i) {
+        Change(mDraw.textures[i], i < count ? GetTexture(mProgram->GetSamplerUnit(i)) : TextureRef{});
+    }
+    mSamples = count > 0;
+}
+
+void RequestedState::AddStatesTo(StateCommit& commit) const {
+    if (mKnowsScissorTest) commit.scissorTest = &mDraw.scissor.on;
+    if (mKnowsScissorRect) commit.scissorRect = &mDraw.scissor.rect;
+    if (mKnowsBlend) commit.blend = &mDraw.blend;
+    if (mKnowsDepthStencil) commit.depthStencil = &mDraw.depthStencil;
+}
+
+std::vector<TextureRef> const& RequestedState::GetTextures() {
+    mBound.clear();
+    for (int i = 0; i < GetUnitCount(); ++i) {
+        TextureRef const texture = GetTexture(i);
+        if (texture.texture != 0) mBound.push_back(texture);
+    }
+    return mBound;
+}
+
+void RequestedState::Forget() {
+    mKnowsScissorTest = mKnowsScissorRect = mKnowsBlend = mKnowsDepthStencil = false;
+    Change(mDraw.blend, DrawState::WithoutBlending());
+    if (!mStencilClip) Change(mDraw.depthStencil, DepthStencilStateDescriptor(false, false));
+}
+
+} // namespace Moka::detail

@@ -1,0 +1,88 @@
+// RequestedState: the state requested for the next draw. The device tracks what GL has; submitting and
+// committing apply this one.
+// Thread: render thread.
+// A part that was not set since external GL may have run is unknown: for the scissor the device is queried,
+// blending and the depth-stencil tests count as off, and a commit leaves unknown parts alone.
+#pragma once
+
+#include "moka/renderer/device/DrawState.h"
+
+#include <memory>
+#include <vector>
+
+namespace Moka::detail {
+
+class Device;
+class ProgramState;
+class TextureStorage;
+struct StateCommit;
+
+class RequestedState {
+public:
+    RequestedState(Device& device, int samplingUnits);
+
+    void SetScissorEnabled(bool on);
+    // Negative sizes become 0.
+    void SetScissorRect(ScissorRect const& rect);
+    bool IsScissorEnabled();
+    ScissorRect const& GetScissorRect();
+    ScissorState const& GetScissor();
+
+    void SetBlend(BlendStateDescriptor const& blend);
+    // Ignored without a stencil test while a stencil clip is on.
+    void SetDepthStencil(DepthStencilStateDescriptor const& depthStencil);
+    void SetStencilClip(bool on) { mStencilClip = on; }
+    BlendStateDescriptor const& GetBlend() const { return mDraw.blend; }
+    DepthStencilStateDescriptor const& GetDepthStencil() const { return mDraw.depthStencil; }
+    bool IsStencilClip() const { return mStencilClip; }
+
+    void SetProgram(std::shared_ptr<ProgramState> program);
+    std::shared_ptr<ProgramState> const& GetProgram() const { return mProgram; }
+
+    int GetUnitCount() const { return static_cast<int>(mUnits.size()); }
+    void SetTexture(int unit, std::shared_ptr<TextureStorage> const& storage, Sampling const& sampling);
+
+    // The state of a draw onto target, with the textures that the program samples. Valid until the next call.
+    DrawState& Resolve(TargetRef const& target, int format, PrimitiveType primitive);
+    // Whether the state differs from the last draw's.
+    bool IsChanged() const { return mChanged; }
+    void SetChanged(bool changed) { mChanged = changed; }
+
+    // Adds what is known of scissor, blend and depth-stencil state. Refers to this object.
+    void AddStatesTo(StateCommit& commit) const;
+    // What is bound to the units, for a commit.
+    std::vector<TextureRef> const& GetTextures();
+
+    // External GL may have changed the states.
+    void Forget();
+
+private:
+    struct Unit {
+        std::weak_ptr<TextureStorage> storage;
+        Sampling sampling;
+    };
+
+    template <class T>
+    void Change(T& kept, T const& value) {
+        if (kept == value) return;
+        kept = value;
+        mChanged = true;
+    }
+    TextureRef GetTexture(int unit) const;
+    void ResolveTextures();
+
+    Device& mDevice;
+    DrawState mDraw;
+    std::shared_ptr<ProgramState> mProgram;
+    std::vector<Unit> mUnits;
+    std::vector<TextureRef> mBound;
+    bool mSamples = false; // the last resolved draw sampled textures
+    bool mChanged = true;
+    bool mStencilClip = false;
+    bool mKnowsScissorTest = false;
+    bool mKnowsScissorRect = false;
+    bool mKnowsBlend = false;
+    bool mKnowsDepthStencil = false;
+};
+
+} // namespace Moka::detail

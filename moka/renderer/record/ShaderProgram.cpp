@@ -1,0 +1,120 @@
+#include "moka/renderer/record/ShaderProgram.h"
+
+#include "moka/renderer/IParameterBinding.h"
+#include "moka/renderer/record/Observer.h"
+#include "moka/renderer/record/ProgramState.h"
+#include "moka/renderer/record/Recorder.h"
+
+#include <new>
+#include <utility>
+
+namespace Moka::detail {
+namespace {
+
+constexpr ObjectKind kKind = ObjectKind::kProgram;
+
+void CommitProgram(Recorder& recorder, ProgramState const& program) {
+    StateCommit commit;
+    commit.program = program.GetName();
+    commit.values = program.GetValues();
+    recorder.Commit(commit);
+}
+
+class Parameter final : public IParameterBinding {
+public:
+    Parameter(std::shared_ptr<ProgramState> program, void const* object, std::size_t handle)
+        : IParameterBinding(program->GetType(handle)),
+          mProgram(std::move(program)),
+          mObject(object),
+          mHandle(handle) {}
+    ~Parameter() override {
+        Observe(kKind, mObject, "ReleaseParameter", mProgram->GetHandleName(mHandle));
+    }
+
+    void Set(void const* value) override {
+        if (theObserver) {
+            theObserver->OnValue(mObject, mProgram->GetHandleName(mHandle), GetType(), value);
+        }
+        if (!mProgram->Set(mHandle, value)) return;
+        // Values of a program that is not the current one wait until it is. Outside of a target the host may
+        // have made a program of its own current.
+        Recorder* const recorder = GetAttachedRecorder();
+        bool const isCurrent = recorder && recorder->IsThrough() && recorder->GetActive() &&
+                               recorder->requested->GetProgram() == mProgram;
+        if (isCurrent && recorder->Begin()) CommitProgram(*recorder, *mProgram);
+    }
+
+private:
+    std::shared_ptr<ProgramState> const mProgram;
+    void const* const mObject; // names the program to the observer, not used otherwise
+    std::size_t const mHandle;
+};
+
+// A parameter of no program. It has no state, so all of them share one place in memory, and handing one out
+// cannot fail.
+class InertParameter final : public IParameterBinding {
+public:
+    static IParameterBinding* Get() {
+        alignas(InertParameter) static unsigned char memory[sizeof(InertParameter)];
+        return ::new (memory) InertParameter;
+    }
+    void Set(void const*) override {}
+    static void operator delete(void*) {}
+
+private:
+    InertParameter() : IParameterBinding(BindingTypeUnknown) {}
+};
+
+class InertProgram final : public IShaderProgram {
+public:
+    void MakeCurrent() override {
+        Recorder* const recorder = GetAttachedRecorder();
+        if (recorder && recorder->Begin()) recorder->requested->SetProgram(nullptr);
+    }
+    void Release() override {}
+    IParameterBinding* GetParameter(char const*) override { return InertParameter::Get(); }
+};
+
+} // namespace
+
+ShaderProgram::ShaderProgram(std::shared_ptr<ProgramState> state) : mState(std::move(state)) {}
+
+IShaderProgram* ShaderProgram::GetInert() {
+    static InertProgram program;
+    return &program;
+}
+
+void ShaderProgram::MakeCurrent() {
+    IShaderProgram* const self = this;
+    Observe(kKind, self, "MakeCurrent");
+    Recorder* const recorder = GetAttachedRecorder();
+    if (!recorder || !recorder->Begin()) return;
+    if (!mState->IsBuiltIn(*recorder)) {
+        try {
+            mState->BuildIn(recorder->shared_from_this());
+        } catch (std::bad_alloc const&) {
+            // It draws nothing.
+        }
+    }
+    recorder->requested->SetProgram(mState);
+    if (recorder->IsThrough()) CommitProgram(*recorder, *mState);
+}
+
+void ShaderProgram::Release() {
+    IShaderProgram* const self = this;
+    Observe(kKind, self, "Release");
+    mState->Release();
+    delete this;
+}
+
+IParameterBinding* ShaderProgram::GetParameter(char const* name) {
+    IShaderProgram* const self = this;
+    Observe(kKind, self, "GetParameter", name ? name : "null");
+    try {
+        return new Parameter(mState, self, mState->AddHandle(name));
+    } catch (std::bad_alloc const&) {
+        return InertParameter::Get();
+    }
+}
+
+} // namespace Moka::detail

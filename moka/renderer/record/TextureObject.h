@@ -1,0 +1,45 @@
+// TextureObject: a view of a storage with a sampling state and a label of its own.
+#pragma once
+
+#include "moka/renderer/ITextureObject.h"
+#include "moka/renderer/device/DrawState.h"
+
+#include <memory>
+#include <string>
+
+namespace Moka::detail {
+
+class TextureStorage;
+
+class TextureObject final : public ITextureObject {
+public:
+    explicit TextureObject(std::shared_ptr<TextureStorage> storage);
+    ~TextureObject() override;
+
+    std::shared_ptr<TextureStorage> const& GetStorage() const { return mStorage; }
+    Sampling const& GetSampling() const { return mSampling; }
+    // As SetParameter, for the initial parameters of a creation.
+    void Store(int id, int value);
+
+    void SetLabel(char const* text) override;
+    char const* GetLabel() const override { return mLabel.c_str(); }
+    void Bind(int unit) override;
+    void Replace(void const* pixels, int stride) override;
+    void Replace(Rect const& rect, void const* pixels, int stride) override;
+    void DrawToCurrent() override;
+    void SetParameter(int id, int value) override;
+    void CopyFromRenderTarget() override;
+    int GetWidth() const override;
+    int GetHeight() const override;
+
+private:
+    void Upload(Rect const& rect, void const* pixels, int stride);
+    // A copy of an image onto itself changes nothing, and GL leaves it undefined.
+    bool IsActiveTarget() const;
+
+    std::shared_ptr<TextureStorage> const mStorage;
+    Sampling mSampling;
+    std::string mLabel;
+};
+
+} // namespace Moka::detail
