@@ -16,9 +16,7 @@ std::size_t CountUnits() {
 
 } // namespace
 
-GlState::GlState(Counters& countersOfContext)
-    : counters(countersOfContext),
-      mUnits(CountUnits()) {
+GlState::GlState(Counters& countersOfContext) : counters(countersOfContext), mUnits(CountUnits()) {
     mSamplerUnits.reserve(mUnits.size());
 }
 

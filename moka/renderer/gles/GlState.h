@@ -7,7 +7,6 @@
 #include "moka/renderer/gles/GlShadow.h"
 #include "moka/renderer/gles/GlStateValues.h"
 
-
 #include <vector>
 
 namespace Moka::detail {

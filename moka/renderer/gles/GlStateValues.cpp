@@ -115,7 +115,9 @@ void GlActiveUnitAccess::Apply(int value, int const*) {
 
 GLuint GlRenderBufferAccess::Query() { return QueryName(GL_RENDERBUFFER_BINDING); }
 
-void GlRenderBufferAccess::Apply(GLuint value, GLuint const*) { Gl::BindRenderbuffer(GL_RENDERBUFFER, value); }
+void GlRenderBufferAccess::Apply(GLuint value, GLuint const*) {
+    Gl::BindRenderbuffer(GL_RENDERBUFFER, value);
+}
 
 GLuint GlProgramAccess::Query() { return QueryName(GL_CURRENT_PROGRAM); }
 

@@ -8,7 +8,6 @@
 #include "moka/renderer/TextureParameter.h"
 #include "moka/renderer/gles/GlState.h"
 
-
 namespace Moka::detail {
 
 constexpr GLenum ToGlFilter(TextureParamFilteringValue value) {

@@ -1,7 +1,7 @@
 #include "moka/renderer/gles/GlVertexFormats.h"
 
-#include "moka/renderer/gles/GlState.h"
 #include "moka/renderer/device/Counters.h"
+#include "moka/renderer/gles/GlState.h"
 
 #include <cstdint>
 

@@ -48,8 +48,8 @@ std::size_t DrawListBuilder::AddValues(ProgramState& program) {
     unsigned char const* const values = program.GetValues();
     std::size_t const size = program.GetSize();
     bool const isHere = listed.list == mNumber;
-    bool const isSame = isHere && (!listed.isStale ||
-                                   std::memcmp(&mList.uniforms[listed.offset], values, size) == 0);
+    bool const isSame =
+        isHere && (!listed.isStale || std::memcmp(&mList.uniforms[listed.offset], values, size) == 0);
     if (!isSame) {
         listed.offset = mList.uniforms.size();
         mList.uniforms.insert(mList.uniforms.end(), values, values + size);

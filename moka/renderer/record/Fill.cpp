@@ -1,7 +1,7 @@
 #include "moka/renderer/record/Fill.h"
 
-#include "moka/renderer/record/Recorder.h"
 #include "moka/renderer/record/ProgramState.h"
+#include "moka/renderer/record/Recorder.h"
 
 namespace Moka::detail {
 namespace {

@@ -47,7 +47,7 @@ private:
     int mCount = 0;
     ListVertices mPlace;
     std::uint64_t mHeldList = 0; // the list that calls KeepVertices
-    std::vector<float> mKept; // used while the list does not have them; its memory is used again
+    std::vector<float> mKept;    // used while the list does not have them; its memory is used again
 };
 
 } // namespace Moka::detail

@@ -5,8 +5,8 @@
 //         after it, with the new object.
 #pragma once
 
-#include "moka/renderer/IParameterBinding.h"
 #include "moka/renderer/IGraphicsObject.h"
+#include "moka/renderer/IParameterBinding.h"
 
 #include <array>
 #include <initializer_list>

@@ -190,26 +190,24 @@ IRenderTarget* RendererFactory::CreateOffscreenRenderTarget(ITextureObject* text
 
 IRenderTarget* RendererFactory::CreateRenderTargetFromDefault(int width, int height) {
     using Result = IRenderTarget*;
-    return CreateIn("CreateRenderTargetFromDefault", ObjectKind::kRenderTarget,
-                    [&](auto const& recorder) -> Result {
-                        Result const target =
-                            MakeTarget(recorder, MakeHostFrameBuffer(*recorder), width, height);
-                        Observe(ObjectKind::kRenderTarget, target, "Create", "default", width, height);
-                        return target;
-                    });
+    return CreateIn(
+        "CreateRenderTargetFromDefault", ObjectKind::kRenderTarget, [&](auto const& recorder) -> Result {
+            Result const target = MakeTarget(recorder, MakeHostFrameBuffer(*recorder), width, height);
+            Observe(ObjectKind::kRenderTarget, target, "Create", "default", width, height);
+            return target;
+        });
 }
 
 IRenderTarget* RendererFactory::CreateRenderTargetFromCurrent(int width, int height) {
     using Result = IRenderTarget*;
-    return CreateIn("CreateRenderTargetFromCurrent", ObjectKind::kRenderTarget,
-                    [&](auto const& recorder) -> Result {
-                        RenderTarget const* const active = recorder->GetActive();
-                        Result const target = MakeTarget(
-                            recorder, active ? active->GetFrameBuffer() : MakeHostFrameBuffer(*recorder),
-                            width, height);
-                        Observe(ObjectKind::kRenderTarget, target, "Create", "current", width, height);
-                        return target;
-                    });
+    return CreateIn(
+        "CreateRenderTargetFromCurrent", ObjectKind::kRenderTarget, [&](auto const& recorder) -> Result {
+            RenderTarget const* const active = recorder->GetActive();
+            Result const target = MakeTarget(
+                recorder, active ? active->GetFrameBuffer() : MakeHostFrameBuffer(*recorder), width, height);
+            Observe(ObjectKind::kRenderTarget, target, "Create", "current", width, height);
+            return target;
+        });
 }
 
 IDepthStencilBuffer* RendererFactory::CreateDepthStencilBuffer(int width, int height) {

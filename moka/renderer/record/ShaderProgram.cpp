@@ -27,9 +27,7 @@ public:
           mProgram(std::move(program)),
           mObject(object),
           mHandle(handle) {}
-    ~Parameter() override {
-        Observe(kKind, mObject, "ReleaseParameter", mProgram->GetHandleName(mHandle));
-    }
+    ~Parameter() override { Observe(kKind, mObject, "ReleaseParameter", mProgram->GetHandleName(mHandle)); }
 
     void Set(void const* value) override {
         if (theObserver) {

@@ -109,9 +109,8 @@ void TextureObject::Upload(Rect const& rect, void const* pixels, int stride) {
                             GetLabel(), static_cast<int>(tight), stride);
         return;
     }
-    PixelBlock const block =
-        PixelBlock::Clip(rect.left, rect.top, std::int64_t{rect.right} - rect.left,
-                         std::int64_t{rect.bottom} - rect.top, GetWidth(), GetHeight());
+    PixelBlock const block = PixelBlock::Clip(rect.left, rect.top, std::int64_t{rect.right} - rect.left,
+                                              std::int64_t{rect.bottom} - rect.top, GetWidth(), GetHeight());
     if (block.IsEmpty()) return;
     recorder.FlushIfUsed(mStorage->GetName());
     recorder.GetDevice().Upload(mStorage->GetName(), block, pixels, stride > 0 ? stride : tight);
