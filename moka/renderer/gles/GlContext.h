@@ -15,6 +15,7 @@
 #include "moka/renderer/gles/GlStatistics.h"
 #include "moka/renderer/gles/GlTargetSwitch.h"
 #include "moka/renderer/gles/GlVertexFormats.h"
+#include "moka/renderer/gles/GlWorkarounds.h"
 
 #include <atomic>
 #include <mutex>
@@ -95,6 +96,7 @@ public:
     void InvalidateState();
     void SetDeferred(bool on);
 
+    GlWorkarounds const workarounds;
     GlStatistics statistics;
     GlState state{statistics};
     GlDebug debug{statistics};

@@ -52,7 +52,12 @@ void GlRenderTarget::ReadPixels(int x, int y, int width, int height, PixelDestin
     block.skippedRows += destination.skipRows;
     block.skippedPixels += destination.skipPixels;
     mContext->Play();
-    mContext->targets.BindRead(GetName());
+    GLuint const name = GetName();
+    if (mContext->workarounds.Needs(GlWorkaround::BindForDrawingToRead)) {
+        mContext->targets.Bind({name, name});
+    } else {
+        mContext->targets.BindRead(name);
+    }
     ReadBackPixels(mContext->state, block, destination.pixels, rowLength);
     mContext->statistics.bytesReadBack += block.GetBytes();
     mContext->debug.Check("reading pixels back");

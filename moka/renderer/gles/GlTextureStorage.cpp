@@ -75,6 +75,7 @@ void GlTextureStorage::Upload(Rect const& rect, void const* pixels, std::int64_t
 void GlTextureStorage::CopyFrom(GLuint frameBuffer, bool hasAlpha, int width, int height) {
     int const w = std::min(width, mWidth);
     int const h = std::min(height, mHeight);
+    FinishDrawing();
     if (hasAlpha) {
         mContext->targets.BindRead(frameBuffer);
         GlEditTexture const edit(mContext->state, mName);
@@ -93,10 +94,15 @@ void GlTextureStorage::CopyFrom(GLuint frameBuffer, bool hasAlpha, int width, in
 void GlTextureStorage::CopyTo(GLuint frameBuffer) {
     GLuint const own = TakeFrameBuffer();
     if (own == 0) return;
+    FinishDrawing();
     Blit(own, frameBuffer, mWidth, mHeight);
     GiveFrameBuffer(own);
     ++mContext->statistics.copies;
     mContext->debug.Check("drawing a texture into the frame buffer");
+}
+
+void GlTextureStorage::FinishDrawing() {
+    if (mContext->workarounds.Needs(GlWorkaround::FinishBeforeCopies)) glFinish();
 }
 
 // Of all state, only the scissor test holds for a blit.

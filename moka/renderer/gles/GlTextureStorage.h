@@ -55,6 +55,8 @@ private:
 
     bool Allocate();
     bool Clear();
+    // Where a copy would otherwise miss what was drawn last.
+    void FinishDrawing();
     void Blit(GLuint from, GLuint to, int width, int height);
     GLuint MakeFrameBuffer();
 

@@ -111,6 +111,7 @@ RenderThread& CanvasDrawing::GetRenderThread() const { return *GetRenderer().Use
 
 void CanvasDrawing::TearDown() {
     GetRenderThread().WaitForTasks();
+    GetRenderThread().WaitForTasks(); // a canvas that goes last posts the end of its bitmap
     ExpectNothingLeft(RendererFactory::GetStatistics(), kept);
     for (std::string const& line : log.GetTexts(ANDROID_LOG_ERROR)) ADD_FAILURE() << line;
     if (kept > 0) GetRenderer().Stop();
