@@ -271,4 +271,10 @@ void MKTextureBitmap::DetachFromCanvasRT(bool release) {
     if (release) Unref();
 }
 
+bool MKTextureBitmap::HasFrameBufferRT(int strip) {
+    // Every strip was created here.
+    auto* const wanted = static_cast<MKSubBitmapBase*>(mSubBitmaps.GetAt(strip < 0 ? 0 : strip));
+    return wanted && wanted->HasFrameBufferRT();
+}
+
 } // namespace Moka

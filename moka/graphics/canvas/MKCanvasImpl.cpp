@@ -201,6 +201,7 @@ void MKCanvasImpl::DrawBitmapsRT(IMKBitmap* src, RectF const& srcRect, std::vect
     std::unique_ptr<std::vector<RectF>> const dsts(dstRects);
     IMKBitmapWritable* const writable = GetBitmap()->GetBitmapWritable();
     if (!held || !dsts || !writable || !FindOrMake(mBitmapDrawable, mQueue)) return;
+    if (!HasFrameBuffer(-1)) return;
     RectF const srcBounds(src->GetBitmapRect());
     if (!srcRect.IsIntersect(srcBounds)) return;
     RectF const bounds(GetBitmap()->GetBitmapRect());
