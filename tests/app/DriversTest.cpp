@@ -76,6 +76,7 @@ protected:
     void Compare(Scene const& scene) {
         TestImage const mesa = Load("mesa/" + scene.name + ".mki");
         TestImage const angle = Load("angle/" + scene.name + ".mki");
+        ASSERT_EQ(mesa.width, scene.width) << scene.name; // the tool has written it
         Slack const allowed = FindAllowed(scene);
         ImageDifference const left = CompareImages(mesa, angle, &allowed);
         if (left.differingPixels > 0)

@@ -95,7 +95,7 @@ TEST_F(CoverageTest, EllipticCornersAndCirclesUnderMatrices) {
                            [&](IMKCanvas& canvas, MKPaint const& paint) {
                                canvas.SetMatrix(matrix);
                                canvas.DrawRoundRect(8, 8, 48, 38, 9, 6.5f, &paint);
-                               canvas.DrawRoundRect(60.25f, 8.5f, 98, 30, 40, 4, &paint);
+                               canvas.DrawRoundRect(60.25f, 8.5f, 98, 30, 40, 14, &paint);
                                canvas.DrawRoundRect(8, 50, 48, 80, 0, 5, &paint);
                                canvas.DrawCircle(76.3f, 60.7f, 14.25f, &paint);
                                canvas.DrawCircle(100, 50, 0.75f, &paint);
