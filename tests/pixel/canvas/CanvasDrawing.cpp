@@ -4,6 +4,7 @@
 #include "moka/graphics/bitmap/MKGraphicsFactory.h"
 #include "moka/renderer/RendererFactory.h"
 #include "tests/support/NothingLeft.h"
+#include "tests/support/reference/ReferenceStage.h"
 
 #include <cstring>
 #include <memory>
@@ -60,16 +61,6 @@ public:
 private:
     IGLMsgQueue& mQueue;
     int const mUseQueue;
-};
-
-class ReferenceStage final : public Scenes::SceneStage {
-public:
-    IMKBitmap* MakeBitmap(Scenes::Picture const& picture) override {
-        TestImage image(picture.width, picture.height);
-        image.pixels = picture.pixels;
-        return new ReferenceBitmap(image);
-    }
-    IGLMsgQueue* GetQueue() override { return nullptr; }
 };
 
 TestImage DrawOnGpu(Drawing const& drawing, IGLMsgQueue& queue, bool onRenderThread) {

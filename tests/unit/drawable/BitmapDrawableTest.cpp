@@ -4,7 +4,6 @@
 #include "moka/graphics/bitmap/IMKTextureBitmap.h"
 #include "moka/graphics/bitmap/MKGraphicsFactory.h"
 #include "moka/graphics/drawable/MKBitmapDrawable.h"
-#include "moka/renderer/IDepthStencilState.h"
 #include "moka/renderer/IRenderTarget.h"
 #include "moka/renderer/ITextureObject.h"
 #include "tests/support/Queues.h"
@@ -116,7 +115,7 @@ TEST_F(BitmapDrawableTest, ABatchIsTheSameVerticesInOneDraw) {
 
 TEST_F(BitmapDrawableTest, TheDrawUsesThePaintAndTheBitmapAndLeavesTheStencilAlone) {
     MKPaint paint = CommonPaint();
-    ForceStencil();
+    ForceOtherStates();
     EXPECT_TRUE(Draw(RectF(0, 0, 5, 5), paint));
     EXPECT_TRUE(DrawBatch({RectF(0, 0, 5, 5)}, paint));
     std::vector<RecordedDraw> const draws = TakeDraws();
@@ -126,6 +125,29 @@ TEST_F(BitmapDrawableTest, TheDrawUsesThePaintAndTheBitmapAndLeavesTheStencilAlo
         EXPECT_TRUE(draw.state.depthStencil.IsStencil());
         EXPECT_EQ(draw.textures.at(0), "texture 1");
         EXPECT_EQ(Values(draw, {"uSrcTexture"}), "0");
+    }
+}
+
+TEST_F(BitmapDrawableTest, OnlyOneGpuGetsTheProgramThatClampsColors) {
+    for (std::string const gpu : {"Mali-T830", "Mali-T830 MP2", "Mali-T83"}) {
+        RecordingRenderer::SetGpuName(gpu);
+        drawable.reset();
+        RecordingRenderer::TakeCalls();
+        drawable.emplace(&queue);
+        char const* const program = gpu == "Mali-T830" ? "MKBitmapShaderColorClamp" : "MKBitmapShader";
+        std::vector<std::string> programs;
+        for (RecordedCall const& call : RecordingRenderer::GetCalls()) {
+            if (call.operation == "Create" && call.object.rfind("program", 0) == 0)
+                programs.push_back(call.arguments);
+        }
+        EXPECT_THAT(programs, ElementsAre(program, "MKBitmapAdvancedBlendingShader"));
+        ForceOtherStates();
+        EXPECT_TRUE(Draw(RectF(0, 0, 5, 5), CommonPaint()));
+        EXPECT_TRUE(DrawBatch({RectF(0, 0, 5, 5)}, CommonPaint()));
+        for (RecordedDraw const& draw : TakeDraws()) {
+            EXPECT_EQ(draw.shader, program);
+            ExpectCommonState(draw);
+        }
     }
 }
 

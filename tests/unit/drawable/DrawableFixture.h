@@ -2,6 +2,8 @@
 #pragma once
 
 #include "moka/graphics/canvas/MKPaint.h"
+#include "moka/renderer/IBlendStateObject.h"
+#include "moka/renderer/IDepthStencilState.h"
 #include "tests/unit/drawable/ShaderFixture.h"
 
 #include <cstddef>
@@ -43,8 +45,11 @@ inline MKPaint CommonPaint() {
     return paint;
 }
 
-// A stencil test, as a clip leaves it.
-inline void ForceStencil() {
+// A stencil test, as a clip leaves it, and no blending.
+inline void ForceOtherStates() {
+    IBlendStateObject* const blend = RendererFactory::CreateBlendStateObject(BlendStateDescriptor(false));
+    blend->Apply();
+    blend->Release();
     DepthStencilStateDescriptor descriptor(false, true);
     descriptor.SetStencilFunction(StencilEqual, 1, 0xFF, 0);
     IDepthStencilState* const state = RendererFactory::CreateDepthStencilState(descriptor);
