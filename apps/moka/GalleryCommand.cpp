@@ -119,11 +119,10 @@ void SavePage(std::string const& page, std::string const& folder, Interruption& 
     throw Failure("cannot write " + path.string());
 }
 
-void SaveAll(Gallery const& gallery, std::string const& folder, LogCollector const& log,
-             Interruption& interruption) {
+void SaveAll(Gallery const& gallery, std::string const& folder, Interruption& interruption) {
     for (std::size_t i = 0; i < gallery.pictures.size(); ++i)
         SavePicture(gallery.pixels[i], (fs::path(folder) / (gallery.pictures[i].GetName() + ".png")).string(),
-                    log, interruption);
+                    interruption);
     SavePage(MakeGalleryPage(gallery.pictures, gallery.device), folder, interruption);
 }
 
@@ -143,7 +142,7 @@ void RunGallery(GalleryOptions const& options) {
         DrawAll(gallery, log, progress);
         progress.SetStage("save the pictures");
         MakeFolder(options.folder);
-        SaveAll(gallery, options.folder, log, interruption);
+        SaveAll(gallery, options.folder, interruption);
     }
     for (GalleryPicture const& picture : gallery.pictures)
         std::printf("%s\n", (fs::path(options.folder) / (picture.GetName() + ".png")).c_str());
