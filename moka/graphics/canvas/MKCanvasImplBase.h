@@ -55,6 +55,7 @@ protected:
     MKCanvasImplBase(IGLMsgQueue* queue, IMKBitmap* bitmap, bool onRenderThread);
 
     MKCanvasClipping* GetClipping() const { return mClipping.get(); }
+    void DeleteClipping() { mClipping.reset(); }
 
     template <class Action>
     void ForEachFrameBuffer(Action const& action) const;

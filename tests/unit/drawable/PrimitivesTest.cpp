@@ -135,6 +135,7 @@ TEST_F(PrimitivesTest, EveryDrawAppliesThePaintAndItsOwnStates) {
     primitives.DrawAll(RectF(2, 2, 12, 12), 3, projection, paint);
     std::vector<RecordedDraw> const draws = TakeDraws();
     EXPECT_THAT(draws, SizeIs(1 + 4 + 2 + 3));
+    EXPECT_EQ(RecordingRenderer::CountCalls("SetDescriptor"), 1 + 1 + 1 + 3) << "equal ones as well";
     for (RecordedDraw const& draw : draws) {
         ExpectCommonState(draw);
         EXPECT_FALSE(draw.state.depthStencil.IsStencil() || draw.state.depthStencil.IsDepth());
@@ -150,6 +151,25 @@ TEST_F(PrimitivesTest, EveryDrawAppliesThePaintAndItsOwnStates) {
         primitives.rect.DrawRectRT(RectF(2, 2, 12, 12), projection, paint);
         EXPECT_EQ(TakeDraw().state.blend.GetColorEquation().destination, BlendingFactor::OneMinusSrcAlpha);
     }
+}
+
+template <class Drawable>
+std::string ObjectsOf() {
+    RecordingRenderer::TakeCalls();
+    auto drawable = std::make_unique<Drawable>();
+    std::vector<std::string> const made = TakeObjects("Create");
+    drawable.reset();
+    EXPECT_EQ(TakeObjects("Release"), made);
+    std::string kinds;
+    for (std::string const& object : made) kinds += object.substr(0, object.find(' ') + 1);
+    return kinds;
+}
+
+TEST_F(PrimitivesTest, GeometriesStatesAndProgramsAreMadeAndReleasedInThatOrder) {
+    EXPECT_EQ(ObjectsOf<MKRectDrawable>(), "graphics blend depthstencil program ");
+    EXPECT_EQ(ObjectsOf<MKCircleDrawable>(), "graphics blend depthstencil program ");
+    EXPECT_EQ(ObjectsOf<MKLineDrawable>(), "graphics graphics blend depthstencil program program ");
+    EXPECT_EQ(ObjectsOf<MKRoundRectDrawable>(), "graphics graphics blend depthstencil program program ");
 }
 
 TEST_F(PrimitivesTest, NumbersThatAreNoneDoNoHarm) {
