@@ -45,8 +45,10 @@ struct Content {
 Picture LoadPicture(SceneValue const& file, std::string const& what, std::string const& folder) {
     fs::path const path = fs::path(folder) / ReadText(file, what + ": file");
     String const name(path.string());
-    std::unique_ptr<Bitmap> const image(BitmapFactory::CreateBitmapForGraphics(&name));
-    if (!image) throw SceneLineError(file.line, what + ": cannot load the image " + path.string());
+    std::string reason;
+    std::unique_ptr<Bitmap> const image(BitmapFactory::CreateBitmapForGraphics(&name, &reason));
+    if (!image)
+        throw SceneLineError(file.line, what + ": cannot load the image " + path.string() + ": " + reason);
     Picture picture(image->GetWidth(), image->GetHeight());
     for (int y = 0; y < picture.height; ++y)
         std::memcpy(picture.At(0, y),

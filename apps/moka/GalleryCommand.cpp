@@ -124,10 +124,9 @@ std::string GetPath(GalleryOptions const& options, GalleryPicture const& picture
     return (fs::path(options.folder) / (picture.GetName() + (options.mki ? ".mki" : ".png"))).string();
 }
 
-void SaveAll(Gallery const& gallery, GalleryOptions const& options, LogCollector const& log,
-             Interruption& interruption) {
+void SaveAll(Gallery const& gallery, GalleryOptions const& options, Interruption& interruption) {
     for (std::size_t i = 0; i < gallery.pictures.size(); ++i)
-        SavePicture(gallery.pixels[i], GetPath(options, gallery.pictures[i]), log, interruption);
+        SavePicture(gallery.pixels[i], GetPath(options, gallery.pictures[i]), interruption);
     if (options.mki) return; // no browser shows them
     SavePage(MakeGalleryPage(gallery.pictures, gallery.device), options.folder, interruption);
 }
@@ -148,7 +147,7 @@ void RunGallery(GalleryOptions const& options) {
         DrawAll(gallery, log, progress);
         progress.SetStage("save the pictures");
         MakeFolder(options.folder);
-        SaveAll(gallery, options, log, interruption);
+        SaveAll(gallery, options, interruption);
     }
     for (GalleryPicture const& picture : gallery.pictures)
         std::printf("%s\n", GetPath(options, picture).c_str());

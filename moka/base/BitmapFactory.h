@@ -4,9 +4,11 @@
 // profiles, gamma, and the orientation a JPEG file may note: rows come as they are stored. Not read:
 // animations.
 // Thread:  any; no state.
-// Fails:   null or false, and one error line that names the file and the reason. Nothing is left behind: a
-//          decode frees what it had, an encode writes a temporary file beside the target, flushes it and
-//          renames.
+// Fails:   null or false, and one error line, "cannot read image 'name': reason" or "cannot save ...", whose
+//          name is masked outside engineering builds (Log::ConvertSecureLog). Nothing is left behind: a decode
+//          frees what it had, an encode writes a temporary file beside the target, flushes it and renames.
+// Reason:  the overloads with one more argument also fill it with the reason alone, for callers who may name
+//          the file. It is untouched on success.
 // Limits:  no side above 65,535, no image above 1 GiB decoded, checked before anything is allocated.
 // Cost:    one decoded copy at a time, plus what the codec needs for a row or a block.
 #pragma once
@@ -15,6 +17,7 @@
 
 #include <cstddef>
 #include <cstdint>
+#include <string>
 
 namespace Moka {
 
@@ -40,11 +43,13 @@ public:
     // Scaled to exactly width x height (both at least 1): by the codec where it can, by area averaging for
     // the rest when shrinking and bilinear when growing.
     static Bitmap* CreateBitmap(String const* path, int width, int height);
+    static Bitmap* CreateBitmap(String const* path, int width, int height, std::string* reason);
 
     // At the file's own size.
     static Bitmap* CreateBitmapForGraphics(String const* path);
+    static Bitmap* CreateBitmapForGraphics(String const* path, std::string* reason);
 
-    // From an encoded file in memory. name appears in messages.
+    // From an encoded file in memory. name appears in messages as a path would.
     static Bitmap* CreateBitmapFromMemory(void const* data, std::size_t size, char const* name);
 
     // Wraps raw pixels; see Bitmap::Construct. With deleteBuffer the new bitmap owns the buffer. Null when
@@ -55,9 +60,11 @@ public:
     // quality is 0 ... 100 (clamped) and means what the codec means by it: JPEG's and WebP's own scale (WebP:
     // 100 is lossless), ignored by PNG and "mki". JPEG is flattened on white.
     static bool SaveBitmap(Bitmap const* bitmap, String const* path, int quality);
+    static bool SaveBitmap(Bitmap const* bitmap, String const* path, int quality, std::string* reason);
 
     // Reads the header only.
     static bool GetImageInfo(String const* path, ImageInfo* info);
+    static bool GetImageInfo(String const* path, ImageInfo* info, std::string* reason);
 
     // Whether SaveBitmap knows the path's extension.
     static ImageFormat GetFormatByExtension(String const* path);

@@ -62,7 +62,14 @@ void LogLineDrawableCreated() {
 MKCanvasImpl::MKCanvasImpl(IGLMsgQueue* queue, IMKBitmap* bitmap, bool onRenderThread)
     : MKCanvasImplBase(queue, bitmap, onRenderThread), mQueue(queue) {}
 
-MKCanvasImpl::~MKCanvasImpl() = default;
+MKCanvasImpl::~MKCanvasImpl() {
+    DeleteClipping();
+    mLineDrawable.reset();
+    mRectDrawable.reset();
+    mRoundRectDrawable.reset();
+    mCircleDrawable.reset();
+    mBitmapDrawable.reset();
+}
 
 template <class DrawCall>
 void MKCanvasImpl::DrawInto(IMKBitmapWritable* writable, int index, Matrix3<float> const& m,

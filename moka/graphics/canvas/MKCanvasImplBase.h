@@ -55,6 +55,7 @@ protected:
     MKCanvasImplBase(IGLMsgQueue* queue, IMKBitmap* bitmap, bool onRenderThread);
 
     MKCanvasClipping* GetClipping() const { return mClipping.get(); }
+    void DeleteClipping() { mClipping.reset(); }
 
     // Of a strip, or with -1 of the target as one. What would be drawn without one is dropped: it would go to
     // whatever the host has bound.

@@ -188,6 +188,28 @@ TEST_F(BitmapDrawableTest, DarkenAndLightenSampleACopyOfTheDestinationMadeOnceAS
                                                 "texture 3 CopyFromRenderTarget", "texture 3 Bind 1"));
 }
 
+TEST_F(BitmapDrawableTest, TheSizeOfTheDestinationIsSetBeforeTheTintsSwitch) {
+    MKPaint paint;
+    paint.SetXFermode(MKPaint::Darken);
+    Draw(RectF(0, 0, 5, 5), paint);
+    std::string values;
+    for (RecordedCall const& call : RecordingRenderer::GetCalls())
+        if (call.operation == "SetParameter" && call.object == "program 2")
+            values += call.arguments.substr(0, call.arguments.find(' ') + 1);
+    EXPECT_EQ(values, "uProjectionMatrix uColor uTintColor uDstTextureSize uHasTintColor uBlendingMode "
+                      "uSrcTexture uDstTexture ");
+}
+
+TEST_F(BitmapDrawableTest, ItReleasesGeometryStatesProgramsAndCopyInThatOrder) {
+    MKPaint paint;
+    paint.SetXFermode(MKPaint::Darken);
+    Draw(RectF(0, 0, 5, 5), paint);
+    RecordingRenderer::TakeCalls();
+    drawable.reset();
+    EXPECT_THAT(TakeObjects("Release"), ElementsAre("graphics 1", "blend 1", "depthstencil 1", "program 1",
+                                                    "program 2", "texture 2"));
+}
+
 TEST_F(BitmapDrawableTest, WithoutACopyOfTheDestinationNothingIsDrawn) {
     MKPaint paint;
     paint.SetXFermode(MKPaint::Darken);

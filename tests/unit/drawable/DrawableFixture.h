@@ -45,6 +45,15 @@ inline MKPaint CommonPaint() {
     return paint;
 }
 
+// The objects that were made, or released, since the calls were last taken, in their order.
+inline std::vector<std::string> TakeObjects(std::string const& operation) {
+    std::vector<std::string> objects;
+    for (RecordedCall const& call : RecordingRenderer::GetCalls())
+        if (call.operation == operation) objects.push_back(call.object);
+    RecordingRenderer::TakeCalls();
+    return objects;
+}
+
 // A stencil test, as a clip leaves it, and no blending.
 inline void ForceOtherStates() {
     IBlendStateObject* const blend = RendererFactory::CreateBlendStateObject(BlendStateDescriptor(false));

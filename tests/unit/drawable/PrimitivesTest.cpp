@@ -145,7 +145,10 @@ TEST_F(PrimitivesTest, EveryDrawAppliesThePaintAndItsOwnStates) {
         EXPECT_THAT(draws, SizeIs(1 + 4 + 2 + 3));
         return draws;
     };
-    for (RecordedDraw const& each : draw()) {
+    RecordingRenderer::TakeCalls();
+    std::vector<RecordedDraw> const draws = draw();
+    EXPECT_EQ(RecordingRenderer::CountCalls("SetDescriptor"), 1 + 1 + 1 + 3) << "equal ones as well";
+    for (RecordedDraw const& each : draws) {
         ExpectCommonState(each);
         EXPECT_FALSE(each.state.depthStencil.IsStencil() || each.state.depthStencil.IsDepth());
     }
@@ -160,6 +163,25 @@ TEST_F(PrimitivesTest, EveryDrawAppliesThePaintAndItsOwnStates) {
     paint.SetXFermode(MKPaint::BlendingOff);
     primitives.rect.DrawRectRT(RectF(2, 2, 12, 12), projection, paint);
     EXPECT_FALSE(TakeDraw().state.blend.IsBlending());
+}
+
+template <class Drawable>
+std::string ObjectsOf() {
+    RecordingRenderer::TakeCalls();
+    auto drawable = std::make_unique<Drawable>();
+    std::vector<std::string> const made = TakeObjects("Create");
+    drawable.reset();
+    EXPECT_EQ(TakeObjects("Release"), made);
+    std::string kinds;
+    for (std::string const& object : made) kinds += object.substr(0, object.find(' ') + 1);
+    return kinds;
+}
+
+TEST_F(PrimitivesTest, GeometriesStatesAndProgramsAreMadeAndReleasedInThatOrder) {
+    EXPECT_EQ(ObjectsOf<MKRectDrawable>(), "graphics blend depthstencil program ");
+    EXPECT_EQ(ObjectsOf<MKCircleDrawable>(), "graphics blend depthstencil program ");
+    EXPECT_EQ(ObjectsOf<MKLineDrawable>(), "graphics graphics blend depthstencil program program ");
+    EXPECT_EQ(ObjectsOf<MKRoundRectDrawable>(), "graphics graphics blend depthstencil program program ");
 }
 
 TEST_F(PrimitivesTest, NumbersThatAreNoneDoNoHarm) {
