@@ -45,6 +45,12 @@ void LogFailure(char const* action, std::string const& path, std::string const& 
                         Printable(path).c_str(), reason.c_str());
 }
 
+// What was read all the same.
+void LogIgnoredProfile(std::string const& path, std::string const& reason) {
+    __android_log_print(ANDROID_LOG_WARN, "mok_log", "image '%s': its colour profile is ignored: %s",
+                        Printable(path).c_str(), reason.c_str());
+}
+
 // Strings and codecs throw when memory runs out, which is a failure like any other here.
 template <class Function>
 auto Attempt(char const* action, Function const& function) -> decltype(function()) {
@@ -105,6 +111,7 @@ Bitmap* DecodeFile(String const* text, PixelSize target) {
     bool const isOpen = ToPath(text, path, reason) && source.OpenFile(path.c_str(), reason);
     Bitmap* const bitmap = isOpen ? Decode(source, target, reason) : nullptr;
     if (!bitmap) LogFailure("read", path, reason);
+    if (bitmap && !reason.empty()) LogIgnoredProfile(path, reason);
     return bitmap;
 }
 
@@ -181,6 +188,7 @@ Bitmap* BitmapFactory::CreateBitmapFromMemory(void const* data, std::size_t size
         source.OpenMemory(data, data ? size : 0);
         Bitmap* const bitmap = Decode(source, {}, reason);
         if (!bitmap) LogFailure("read", name ? name : "in memory", reason);
+        if (bitmap && !reason.empty()) LogIgnoredProfile(name ? name : "in memory", reason);
         return bitmap;
     });
 }
