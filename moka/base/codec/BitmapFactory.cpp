@@ -63,7 +63,7 @@ auto Attempt(char const* action, Function const& function) -> decltype(function(
 }
 
 bool ToPath(String const* text, std::string& path, std::string& reason) {
-    if (text) path = text->ToUtf8();
+    if (text) path = text->ToFileName();
     if (path.empty()) {
         reason = "no path is given";
     } else if (path.find('\0') != std::string::npos) {

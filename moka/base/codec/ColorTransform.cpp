@@ -40,7 +40,8 @@ Profile OpenProfile(cmsContext context, ByteSpan bytes) {
 
 // Others (links of devices, abstract and named colours) do not say what a file's numbers look like.
 bool IsOfDevice(cmsHPROFILE profile) {
-    switch (cmsGetDeviceClass(profile)) {
+    // As a number, like the colour space below: a file may hold values that the enumerations do not have.
+    switch (static_cast<cmsUInt32Number>(cmsGetDeviceClass(profile))) {
     case cmsSigInputClass:
     case cmsSigDisplayClass:
     case cmsSigOutputClass:
@@ -52,7 +53,7 @@ bool IsOfDevice(cmsHPROFILE profile) {
 }
 
 // 0 where the profile is not for such pixels.
-cmsUInt32Number ChooseFormat(cmsColorSpaceSignature space, PixelKind kind) {
+cmsUInt32Number ChooseFormat(cmsUInt32Number space, PixelKind kind) {
     constexpr cmsUInt32Number kGreyAndThree =
         COLORSPACE_SH(PT_GRAY) | EXTRA_SH(3) | CHANNELS_SH(1) | BYTES_SH(1);
     switch (kind) {
@@ -116,7 +117,8 @@ bool ColorTransform::Open(Chromaticities const& primaries, double gamma, std::st
 
 bool ColorTransform::Create(void* profile, PixelKind kind, std::string& reason) {
     cmsContext const context = ToContext(mContext.get());
-    cmsUInt32Number const format = ChooseFormat(cmsGetColorSpace(profile), kind);
+    cmsUInt32Number const format =
+        ChooseFormat(static_cast<cmsUInt32Number>(cmsGetColorSpace(profile)), kind);
     if (format == 0) return Refuse(reason, "it is for another kind of colours than the pixels");
     mIsCmyk = kind == PixelKind::CmykInk || kind == PixelKind::CmykLight;
     Profile const target(cmsCreate_sRGBProfileTHR(context));
