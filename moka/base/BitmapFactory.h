@@ -1,8 +1,10 @@
 // BitmapFactory: decodes and encodes image files: PNG, JPEG, WebP and this platform's "mki". Reading chooses
 // the codec by content, writing by the path's extension ("png", "jpg", "jpeg", "webp", "mki"; any case). In
-// memory always RGBA8, premultiplied, stride width * 4, in a buffer the bitmap owns. Not looked at: colour
-// profiles, gamma, and the orientation a JPEG file may note: rows come as they are stored. Not read:
-// animations.
+// memory always RGBA8, premultiplied, sRGB, stride width * 4, in a buffer the bitmap owns. Colours: what a
+// file says of them (an ICC profile; a PNG's gamma and primaries) is converted to sRGB, 8 bits a channel; a
+// file that says nothing keeps every byte. A profile that cannot be used is ignored, with one warning. Of an
+// animated WebP the first frame is decoded, of an animated PNG its default image. Not applied: the orientation
+// that a camera notes; rows come as they are stored.
 // Thread:  any; no state.
 // Fails:   null or false, and one error line, "cannot read image 'name': reason" or "cannot save ...", whose
 //          name is masked outside engineering builds (Log::ConvertSecureLog). Nothing is left behind: a decode
@@ -33,6 +35,9 @@ struct ImageInfo {
     int height = 0;
     bool hasAlpha = false;
     std::uint64_t fileBytes = 0;
+    std::string profile; // of colours: an ICC profile's name, "sRGB", or "gamma 0.45455"; empty without any
+    int orientation = 1; // as EXIF numbers it, 1 to 8; 1 is upright
+    int frames = 1;      // of an animation
 };
 
 class MOKA_API BitmapFactory {

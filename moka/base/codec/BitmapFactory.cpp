@@ -59,6 +59,12 @@ void TellNoMemory(std::string* told) noexcept {
     }
 }
 
+// What was read all the same.
+void LogIgnoredProfile(std::string const& path, std::string const& reason) {
+    __android_log_print(ANDROID_LOG_WARN, "mok_log", "image '%s': its colour profile is ignored: %s",
+                        Printable(path).c_str(), reason.c_str());
+}
+
 // Strings and codecs throw when memory runs out, which is a failure like any other here.
 template <class Function>
 auto Attempt(char const* action, std::string* told, Function const& function) -> decltype(function()) {
@@ -72,7 +78,7 @@ auto Attempt(char const* action, std::string* told, Function const& function) ->
 }
 
 bool ToPath(String const* text, std::string& path, std::string& reason) {
-    if (text) path = text->ToUtf8();
+    if (text) path = text->ToFileName();
     if (path.empty()) {
         reason = "no path is given";
     } else if (path.find('\0') != std::string::npos) {
@@ -120,6 +126,7 @@ Bitmap* DecodeFile(String const* text, PixelSize target, std::string* told) {
     bool const isOpen = ToPath(text, path, reason) && source.OpenFile(path.c_str(), reason);
     Bitmap* const bitmap = isOpen ? Decode(source, target, reason) : nullptr;
     if (!bitmap) Fail("read", path, reason, told);
+    if (bitmap && !reason.empty()) LogIgnoredProfile(path, reason);
     return bitmap;
 }
 
@@ -205,6 +212,7 @@ Bitmap* BitmapFactory::CreateBitmapFromMemory(void const* data, std::size_t size
         source.OpenMemory(data, data ? size : 0);
         Bitmap* const bitmap = Decode(source, {}, reason);
         if (!bitmap) LogFailure("read", name ? name : "", reason);
+        if (bitmap && !reason.empty()) LogIgnoredProfile(name ? name : "", reason);
         return bitmap;
     });
 }
