@@ -73,7 +73,7 @@ void ReadAndDraw(std::string_view text) {
         bool const isSmall = CountRepetitions(root) <= kMostDrawn;
         Scene const scene = Scenes::ParseScene(text, "fuzz.json", "no-such-folder");
         if (isSmall) Draw(scene, nothing);
-    } catch (Scenes::SceneLineError const&) {
+    } catch (Scenes::SceneTextError const&) {
         // Out of the tree, which knows no file.
     } catch (Scenes::SceneError const& error) {
         RequireMessage(error.what());

@@ -76,14 +76,20 @@ void DrawCrossFade(IMKCanvas& canvas, SceneStage& stage) {
 }
 
 void DrawTextMask(IMKCanvas& canvas, SceneStage& stage) {
-    BitmapPtr const letters = MakeBitmap(stage, "letters", 130, 108);
-    BitmapPtr const photo = MakeBitmap(stage, "photo", 420, 140);
     MKPaint paint;
+    BitmapPtr const letters = MakeBitmap(stage, "letters", 130, 108);
+    BitmapPtr const small = MakeBitmap(stage, "letters", 26, 27);
+    BitmapPtr const soft = DrawAside(stage, 130, 108, [&](IMKCanvas& other) {
+        other.DrawBitmap(small.Get(), RectF(0, 0, 130, 108), &paint);
+    });
+    BitmapPtr const disc = MakeBitmap(stage, "disc", 108, 108);
+    IMKBitmap* const masks[] = {letters.Get(), soft.Get(), disc.Get()};
+    BitmapPtr const photo = MakeBitmap(stage, "photo", 420, 140);
     canvas.DrawBitmap(photo.Get(), 10, 10, &paint);
     constexpr unsigned kColors[] = {0xFFFFFFFF, 0xFFD9A441, 0xFF2A1A3A};
     for (int i = 0; i < 3; ++i) {
         auto const mask = MakeDrawable<MKTextMaskBitmapDrawable>(stage.GetQueue());
-        mask->SetBitmap(letters.Get());
+        mask->SetBitmap(masks[i]);
         mask->SetDstPosition(20 + 135 * static_cast<float>(i), 26);
         paint.SetColor(static_cast<int>(kColors[i]));
         canvas.Draw(mask.Get(), &paint);
@@ -96,7 +102,8 @@ RefPtr<MKGaussianBlurDrawable> MakeBlur(SceneStage& stage, BitmapPtr const& bitm
     auto blur = MakeDrawable<MKGaussianBlurDrawable>(stage.GetQueue());
     blur->SetBitmap(bitmap.Get());
     blur->SetHorizotalDirection(direction == Direction::Across);
-    blur->SetBlurAmount(2);
+    // Taps between texels, where the filter mixes two of them: at whole texels they would show as stripes.
+    blur->SetBlurAmount(1.5f);
     return blur;
 }
 
@@ -112,7 +119,12 @@ BitmapPtr BlurAcross(SceneStage& stage, BitmapPtr const& bitmap) {
 }
 
 void DrawGaussianBlur(IMKCanvas& canvas, SceneStage& stage) {
-    BitmapPtr const letters = MakeBitmap(stage, "letters", kBlurWidth, kBlurHeight);
+    BitmapPtr const small = MakeBitmap(stage, "letters", 91, 72);
+    // With room around them for the blur and the shadow's offset.
+    BitmapPtr const letters = DrawAside(stage, kBlurWidth, kBlurHeight, [&](IMKCanvas& other) {
+        MKPaint plain;
+        other.DrawBitmap(small.Get(), 8, 8, &plain);
+    });
     BitmapPtr const across = BlurAcross(stage, letters);
     MKPaint paint;
     canvas.DrawBitmap(letters.Get(), 14, 14, &paint);
@@ -176,7 +188,9 @@ Scene MakeScene(char const* name, char const* about, int width, int height, Draw
 std::vector<Scene> MakeCustomScenes() {
     return {
         MakeScene("cross-fade", "From one picture to another in five steps.", 542, 138, DrawCrossFade),
-        MakeScene("text-mask", "The alpha of the letters, painted in three colours.", 440, 160, DrawTextMask),
+        MakeScene("text-mask",
+                  "The alpha of sharp letters, of soft ones and of a disc that fades, in three colours.", 440,
+                  160, DrawTextMask),
         MakeScene(
             "gaussian-blur",
             "Sharp, blurred across, blurred downwards; both, both tinted and offset, and that as a shadow.",

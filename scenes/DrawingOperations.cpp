@@ -8,7 +8,7 @@ using Kind = SceneValue::Kind;
 
 MKPaint GetPaint(SceneFields& fields, SceneNames const& names) {
     SceneValue const* const value = fields.Find("paint");
-    return value ? ReadPaint(*value, fields.Name("paint"), names.paints) : MKPaint();
+    return value ? ReadPaint(*value, names.paints) : MKPaint();
 }
 
 SceneOperation ReadDrawLine(SceneFields& fields, SceneNames const& names) {
@@ -42,20 +42,19 @@ SceneOperation ReadDrawCircle(SceneFields& fields, SceneNames const& names) {
 
 // The places of a batch: a list of them, or {"columns", "rows", "from", "step"} for a grid, in rows.
 template <class Place, class ReadOne, class ReadGridPlace>
-std::vector<Place> ReadPlaces(SceneValue const& value, std::string const& what, ReadOne const& readOne,
+std::vector<Place> ReadPlaces(SceneValue const& value, ReadOne const& readOne,
                               ReadGridPlace const& readGridPlace) {
     std::vector<Place> places;
     if (value.kind == Kind::List) {
-        for (SceneValue const& item : value.items) places.push_back(readOne(item, what));
+        for (SceneValue const& item : value.items) places.push_back(readOne(item));
         return places;
     }
-    if (value.kind != Kind::Object) ThrowExpected(value, what, "a list or a grid, { \"columns\", ... }");
-    SceneFields fields(value, what);
-    int const columns = ReadInt(fields.Get("columns"), fields.Name("columns"), 1, 10'000);
-    int const rows = ReadInt(fields.Get("rows"), fields.Name("rows"), 1, 10'000);
+    if (value.kind != Kind::Object) ThrowExpected(value, "a list or a grid, { \"columns\", ... }");
+    SceneFields fields(value);
+    int const columns = ReadInt(fields.Get("columns"), 1, 10'000);
+    int const rows = ReadInt(fields.Get("rows"), 1, 10'000);
     if (static_cast<long long>(columns) * rows > kMaxOperations)
-        throw SceneLineError(value.line,
-                             what + " has more than " + std::to_string(kMaxOperations) + " places");
+        throw SceneValueError(value, ": more than " + std::to_string(kMaxOperations) + " places");
     PointF const from = fields.GetPoint("from");
     PointF const step = fields.GetPoint("step");
     auto const makePlace = readGridPlace(fields);
@@ -67,13 +66,13 @@ std::vector<Place> ReadPlaces(SceneValue const& value, std::string const& what, 
     return places;
 }
 
-std::vector<PointF> ReadPoints(SceneValue const& value, std::string const& what) {
-    return ReadPlaces<PointF>(value, what, ReadPoint,
+std::vector<PointF> ReadPoints(SceneValue const& value) {
+    return ReadPlaces<PointF>(value, ReadPoint,
                               [](SceneFields&) { return [](float x, float y) { return PointF(x, y); }; });
 }
 
-std::vector<RectF> ReadRects(SceneValue const& value, std::string const& what) {
-    return ReadPlaces<RectF>(value, what, ReadRect, [](SceneFields& fields) {
+std::vector<RectF> ReadRects(SceneValue const& value) {
+    return ReadPlaces<RectF>(value, ReadRect, [](SceneFields& fields) {
         return [size = fields.GetPoint("size")](float x, float y) {
             return RectF(x, y, x + size.x, y + size.y);
         };
@@ -81,11 +80,11 @@ std::vector<RectF> ReadRects(SceneValue const& value, std::string const& what) {
 }
 
 SceneOperation ReadDrawSimpleLines(SceneFields& fields, SceneNames const& names) {
-    std::vector<PointF> points = ReadPoints(fields.Get("points"), fields.Name("points"));
+    SceneValue const& value = fields.Get("points");
+    std::vector<PointF> points = ReadPoints(value);
     if (points.size() % 2 != 0)
-        throw SceneLineError(fields.GetLine(), fields.Name("points") +
-                                                   " must be an even number of points, not " +
-                                                   std::to_string(points.size()) + ": two for each line");
+        throw SceneValueError(value, " must be an even number of points, not " +
+                                         std::to_string(points.size()) + ": two for each line");
     long long const count = static_cast<long long>(points.size() / 2);
     return {[points = std::move(points), paint = GetPaint(fields, names)](
                 IMKCanvas& canvas, SceneBitmaps const&) { canvas.DrawSimpleLines(points, &paint); },
@@ -94,12 +93,11 @@ SceneOperation ReadDrawSimpleLines(SceneFields& fields, SceneNames const& names)
 
 std::size_t GetBitmap(SceneFields& fields, SceneNames const& names) {
     SceneValue const& value = fields.Get("bitmap");
-    auto const found = names.bitmaps.find(ReadText(value, fields.Name("bitmap")));
+    auto const found = names.bitmaps.find(ReadText(value));
     if (found != names.bitmaps.end()) return found->second;
     std::string known;
     for (auto const& entry : names.bitmaps) known += (known.empty() ? "" : ", ") + entry.first;
-    ThrowExpected(value, fields.Name("bitmap"),
-                  known.empty() ? "described under \"bitmaps\"" : "one of " + known);
+    ThrowExpected(value, known.empty() ? "described under \"bitmaps\"" : "one of " + known);
 }
 
 SceneOperation ReadDrawBitmap(SceneFields& fields, SceneNames const& names) {
@@ -123,7 +121,7 @@ SceneOperation ReadDrawBitmap(SceneFields& fields, SceneNames const& names) {
 }
 
 SceneOperation ReadDrawBitmapsAtPoints(SceneFields& fields, std::size_t bitmap, MKPaint const& paint) {
-    std::vector<PointF> const points = ReadPoints(fields.Get("points"), fields.Name("points"));
+    std::vector<PointF> const points = ReadPoints(fields.Get("points"));
     return {[=](IMKCanvas& canvas, SceneBitmaps const& bitmaps) {
                 std::vector<PointF> copy = points;
                 canvas.DrawBitmaps(bitmaps[bitmap].Get(), copy, &paint);
@@ -136,7 +134,7 @@ SceneOperation ReadDrawBitmaps(SceneFields& fields, SceneNames const& names) {
     MKPaint const paint = GetPaint(fields, names);
     SceneValue const* const src = fields.Find("src");
     if (!src && !fields.Find("dsts")) return ReadDrawBitmapsAtPoints(fields, bitmap, paint);
-    std::vector<RectF> const dsts = ReadRects(fields.Get("dsts"), fields.Name("dsts"));
+    std::vector<RectF> const dsts = ReadRects(fields.Get("dsts"));
     long long const count = static_cast<long long>(dsts.size());
     if (!src)
         return {[=](IMKCanvas& canvas, SceneBitmaps const& bitmaps) {

@@ -56,11 +56,13 @@ Texel Photo(Place const& p) {
     int const v = p.y * 1000 / p.height;
     int const grain = Noise(p.x, p.y) / 24 - 5;
     Texel t = Mix({62, 108, 184, 255}, {250, 206, 150, 255}, v, 640);
-    int const side = std::min(p.width, p.height);
-    int const dx = p.x - p.width * 7 / 10;
-    int const dy = p.y - p.height * 3 / 10;
-    int const radius = side / 9;
-    if (dx * dx + dy * dy <= radius * radius) t = {255, 244, 200, 255};
+    // The sun, in half pixels: its edge is soft over one pixel.
+    int const dx = 2 * p.x + 1 - p.width * 14 / 10;
+    int const dy = 2 * p.y + 1 - p.height * 6 / 10;
+    int const radius = std::max(1, std::min(p.width, p.height) * 2 / 9);
+    long long const inside = 1LL * radius * radius - 1LL * dx * dx - 1LL * dy * dy;
+    auto const part = static_cast<int>(std::clamp(inside + 2 * radius, 0LL, 4LL * radius));
+    t = Mix(t, {255, 244, 200, 255}, part, 4 * radius);
     if (v > 1000 - Ridge(p.x + p.width / 5, p.width, 620, 380, 610)) t = {104, 112, 150, 255};
     if (v > 1000 - Ridge(p.x, p.width, 450, 270, 430)) t = {64, 88, 104, 255};
     if (v > 780) t = Mix({58, 112, 78, 255}, {30, 58, 44, 255}, v - 780, 220);

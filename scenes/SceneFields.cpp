@@ -29,60 +29,58 @@ bool IsHexColor(std::string const& text) {
 
 } // namespace
 
-void ThrowExpected(SceneValue const& value, std::string const& what, std::string const& expected) {
-    throw SceneLineError(value.line, what + " must be " + expected + ", not " + value.Describe());
+void ThrowExpected(SceneValue const& value, std::string const& expected) {
+    throw SceneValueError(value, " must be " + expected + ", not " + value.Describe());
 }
 
-bool ReadBool(SceneValue const& value, std::string const& what) {
-    if (value.kind != Kind::Boolean) ThrowExpected(value, what, "true or false");
+bool ReadBool(SceneValue const& value) {
+    if (value.kind != Kind::Boolean) ThrowExpected(value, "true or false");
     return value.number != 0;
 }
 
-float ReadFloat(SceneValue const& value, std::string const& what) {
-    if (value.kind != Kind::Number) ThrowExpected(value, what, "a number");
+float ReadFloat(SceneValue const& value) {
+    if (value.kind != Kind::Number) ThrowExpected(value, "a number");
     return static_cast<float>(value.number);
 }
 
-int ReadInt(SceneValue const& value, std::string const& what, int low, int high) {
+int ReadInt(SceneValue const& value, int low, int high) {
     if (IsWholeNumber(value, low, high)) return static_cast<int>(value.number);
     bool const isAny = low == INT_MIN && high == INT_MAX;
-    ThrowExpected(value, what,
-                  isAny ? "a whole number"
-                        : "a whole number from " + std::to_string(low) + " to " + std::to_string(high));
+    ThrowExpected(value, isAny
+                             ? "a whole number"
+                             : "a whole number from " + std::to_string(low) + " to " + std::to_string(high));
 }
 
-std::string ReadText(SceneValue const& value, std::string const& what) {
-    if (value.kind != Kind::Text) ThrowExpected(value, what, "a text");
+std::string ReadText(SceneValue const& value) {
+    if (value.kind != Kind::Text) ThrowExpected(value, "a text");
     return value.text;
 }
 
-std::vector<float> ReadFloats(SceneValue const& value, std::string const& what, std::size_t count,
-                              char const* form) {
-    if (value.kind != Kind::List || value.items.size() != count) ThrowExpected(value, what, form);
+std::vector<float> ReadFloats(SceneValue const& value, std::size_t count, char const* form) {
+    if (value.kind != Kind::List || value.items.size() != count) ThrowExpected(value, form);
     std::vector<float> numbers;
     for (SceneValue const& item : value.items) {
-        if (item.kind != Kind::Number)
-            ThrowExpected(item, what + "[" + std::to_string(numbers.size()) + "]", "a number");
+        if (item.kind != Kind::Number) ThrowExpected(item, "a number");
         numbers.push_back(static_cast<float>(item.number));
     }
     return numbers;
 }
 
-PointF ReadPoint(SceneValue const& value, std::string const& what) {
-    std::vector<float> const n = ReadFloats(value, what, 2, "[x, y]");
+PointF ReadPoint(SceneValue const& value) {
+    std::vector<float> const n = ReadFloats(value, 2, "[x, y]");
     return {n[0], n[1]};
 }
 
-RectF ReadRect(SceneValue const& value, std::string const& what) {
-    std::vector<float> const n = ReadFloats(value, what, 4, "[left, top, right, bottom]");
+RectF ReadRect(SceneValue const& value) {
+    std::vector<float> const n = ReadFloats(value, 4, "[left, top, right, bottom]");
     return {n[0], n[1], n[2], n[3]};
 }
 
-Matrix3f ReadMatrix(SceneValue const& value, std::string const& what) {
-    return Matrix3f(ReadFloats(value, what, 9, "nine numbers, column by column").data());
+Matrix3f ReadMatrix(SceneValue const& value) {
+    return Matrix3f(ReadFloats(value, 9, "nine numbers, column by column").data());
 }
 
-Vector4<float> ReadColor(SceneValue const& value, std::string const& what) {
+Vector4<float> ReadColor(SceneValue const& value) {
     constexpr char kForms[] = "\"#RRGGBB\", \"#AARRGGBB\", [r, g, b] or [r, g, b, a]";
     if (value.kind == Kind::Text && IsHexColor(value.text)) {
         unsigned const argb = static_cast<unsigned>(std::stoul(value.text.substr(1), nullptr, 16));
@@ -91,21 +89,20 @@ Vector4<float> ReadColor(SceneValue const& value, std::string const& what) {
         return paint.GetColor();
     }
     bool const hasAlpha = value.items.size() == 4;
-    std::vector<float> const n = ReadFloats(value, what, hasAlpha ? 4 : 3, kForms);
+    std::vector<float> const n = ReadFloats(value, hasAlpha ? 4 : 3, kForms);
     return {n[0], n[1], n[2], hasAlpha ? n[3] : 1};
 }
 
-int ReadEnum(SceneValue const& value, std::string const& what, std::vector<std::string> const& names) {
+int ReadEnum(SceneValue const& value, std::vector<std::string> const& names) {
     if (IsWholeNumber(value, INT_MIN, INT_MAX)) return static_cast<int>(value.number);
     auto const found = std::find(names.begin(), names.end(), value.text);
     if (value.kind != Kind::Text || found == names.end())
-        ThrowExpected(value, what, "one of " + Join(names) + " or its number");
+        ThrowExpected(value, "one of " + Join(names) + " or its number");
     return static_cast<int>(found - names.begin());
 }
 
-SceneFields::SceneFields(SceneValue const& object, std::string what)
-    : mObject(object), mWhat(std::move(what)) {
-    if (object.kind != Kind::Object) ThrowExpected(object, mWhat, "an object, { ... }");
+SceneFields::SceneFields(SceneValue const& object) : mObject(object) {
+    if (object.kind != Kind::Object) ThrowExpected(object, "an object, { ... }");
 }
 
 SceneValue const* SceneFields::Find(char const* key) {
@@ -118,7 +115,7 @@ SceneValue const* SceneFields::Find(char const* key) {
 
 SceneValue const& SceneFields::Get(char const* key) {
     SceneValue const* const value = Find(key);
-    if (!value) throw SceneLineError(mObject.line, mWhat + " needs \"" + key + "\"");
+    if (!value) throw SceneValueError(mObject, std::string(" needs \"") + key + "\"");
     return *value;
 }
 
@@ -126,9 +123,8 @@ void SceneFields::CheckAll() const {
     for (std::size_t i = 0; i < mObject.keys.size(); ++i) {
         std::string const& key = mObject.keys[i];
         if (std::find(mAsked.begin(), mAsked.end(), key) == mAsked.end())
-            throw SceneLineError(mObject.items[i].line, mWhat + " knows " +
-                                                            (mAsked.empty() ? "no fields" : Join(mAsked)) +
-                                                            "; not \"" + key + "\"");
+            throw SceneValueError(mObject.items[i],
+                                  " is unknown; there are " + (mAsked.empty() ? "no fields" : Join(mAsked)));
     }
 }
 

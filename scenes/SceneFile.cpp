@@ -25,6 +25,7 @@ using Kind = SceneValue::Kind;
 constexpr int kMaxSide = 16384;
 constexpr int kMaxPictureSide = 4096;
 constexpr std::size_t kMaxBitmaps = 64;
+constexpr std::int64_t kMaxPicturePixels = std::int64_t{64} << 20; // 256 MiB
 constexpr std::uintmax_t kMaxFileBytes = 16u << 20;
 
 struct Content {
@@ -42,11 +43,57 @@ struct Content {
     }
 };
 
-Picture LoadPicture(SceneValue const& file, std::string const& what, std::string const& folder) {
-    fs::path const path = fs::path(folder) / ReadText(file, what + ": file");
-    String const name(path.string());
-    std::unique_ptr<Bitmap> const image(BitmapFactory::CreateBitmapForGraphics(&name));
-    if (!image) throw SceneLineError(file.line, what + ": cannot load the image " + path.string());
+// A bitmap whose size is known and whose pixels are not there yet.
+struct BitmapPlan {
+    SceneValue const* source; // what says it
+    std::string path;         // of the file; empty for one made by rule
+    std::size_t kind = 0;
+    int width = 0;
+    int height = 0;
+};
+
+[[noreturn]] void ThrowUnreadable(BitmapPlan const& plan, std::string const& reason) {
+    throw SceneValueError(*plan.source, ": cannot load the image " + plan.path + ": " + reason);
+}
+
+BitmapPlan PlanFile(SceneValue const& file, std::string const& folder) {
+    BitmapPlan plan{&file, (fs::path(folder) / ReadText(file)).string()};
+    String const name = String::FromFileName(plan.path);
+    ImageInfo info;
+    std::string reason;
+    if (!BitmapFactory::GetImageInfo(&name, &info, &reason)) ThrowUnreadable(plan, reason);
+    plan.width = info.width;
+    plan.height = info.height;
+    return plan;
+}
+
+BitmapPlan PlanNamed(SceneFields& fields) {
+    std::vector<std::string> const& kinds = GetPictureNames();
+    SceneValue const& kind = fields.Get("picture");
+    auto const found = std::find(kinds.begin(), kinds.end(), kind.text);
+    if (found == kinds.end()) {
+        std::string known;
+        for (std::string const& name : kinds) known += (known.empty() ? "" : ", ") + name;
+        ThrowExpected(kind, "one of " + known);
+    }
+    return {&kind, "", static_cast<std::size_t>(found - kinds.begin()),
+            ReadInt(fields.Get("width"), 1, kMaxPictureSide),
+            ReadInt(fields.Get("height"), 1, kMaxPictureSide)};
+}
+
+BitmapPlan PlanBitmap(SceneValue const& value, std::string const& folder) {
+    SceneFields fields(value);
+    SceneValue const* const file = fields.Find("file");
+    BitmapPlan plan = file ? PlanFile(*file, folder) : PlanNamed(fields);
+    fields.CheckAll();
+    return plan;
+}
+
+Picture LoadPicture(BitmapPlan const& plan) {
+    String const name = String::FromFileName(plan.path);
+    std::string reason;
+    std::unique_ptr<Bitmap> const image(BitmapFactory::CreateBitmapForGraphics(&name, &reason));
+    if (!image) ThrowUnreadable(plan, reason);
     Picture picture(image->GetWidth(), image->GetHeight());
     for (int y = 0; y < picture.height; ++y)
         std::memcpy(picture.At(0, y),
@@ -55,100 +102,102 @@ Picture LoadPicture(SceneValue const& file, std::string const& what, std::string
     return picture;
 }
 
-Picture ReadPicture(SceneValue const& value, std::string const& what, std::string const& folder) {
-    SceneFields fields(value, what);
-    Picture picture;
-    if (SceneValue const* const file = fields.Find("file")) {
-        picture = LoadPicture(*file, what, folder);
-    } else {
-        std::vector<std::string> const& kinds = GetPictureNames();
-        SceneValue const& kind = fields.Get("picture");
-        auto const found = std::find(kinds.begin(), kinds.end(), kind.text);
-        if (found == kinds.end()) {
-            std::string known;
-            for (std::string const& name : kinds) known += (known.empty() ? "" : ", ") + name;
-            ThrowExpected(kind, fields.Name("picture"), "one of " + known);
-        }
-        int const width = ReadInt(fields.Get("width"), fields.Name("width"), 1, kMaxPictureSide);
-        int const height = ReadInt(fields.Get("height"), fields.Name("height"), 1, kMaxPictureSide);
-        picture = MakePicture(static_cast<std::size_t>(found - kinds.begin()), width, height);
-    }
-    fields.CheckAll();
-    return picture;
-}
-
-void CheckIsObject(SceneValue const& value, std::string const& what) {
-    if (value.kind != Kind::Object) ThrowExpected(value, what, "an object of names, { ... }");
+void CheckIsObject(SceneValue const& value) {
+    if (value.kind != Kind::Object) ThrowExpected(value, "an object of names, { ... }");
 }
 
 void ReadBitmaps(SceneValue const& value, std::string const& folder, Content& content) {
-    CheckIsObject(value, "bitmaps");
+    CheckIsObject(value);
     if (value.keys.size() > kMaxBitmaps)
-        throw SceneLineError(value.line, "a scene may have " + std::to_string(kMaxBitmaps) + " bitmaps");
+        throw SceneValueError(value, ": a scene may have " + std::to_string(kMaxBitmaps) + " bitmaps");
+    std::vector<BitmapPlan> plans;
+    std::int64_t pixels = 0;
     for (std::size_t i = 0; i < value.keys.size(); ++i) {
         content.names.bitmaps[value.keys[i]] = i;
-        content.pictures.push_back(
-            ReadPicture(value.items[i], "the bitmap \"" + value.keys[i] + "\"", folder));
+        plans.push_back(PlanBitmap(value.items[i], folder));
+        pixels += std::int64_t{plans.back().width} * plans.back().height;
+        if (pixels > kMaxPicturePixels)
+            throw SceneValueError(value.items[i], ": all bitmaps of a scene together may have " +
+                                                      std::to_string(kMaxPicturePixels) + " pixels");
     }
+    for (BitmapPlan const& plan : plans)
+        content.pictures.push_back(plan.path.empty() ? MakePicture(plan.kind, plan.width, plan.height)
+                                                     : LoadPicture(plan));
 }
 
 void ReadPaints(SceneValue const& value, NamedPaints& paints) {
-    CheckIsObject(value, "paints");
+    CheckIsObject(value);
     for (std::size_t i = 0; i < value.keys.size(); ++i)
-        paints[value.keys[i]] = ReadPaint(value.items[i], "the paint \"" + value.keys[i] + "\"", paints);
+        paints[value.keys[i]] = ReadPaint(value.items[i], paints);
 }
 
 void ReadSize(SceneFields& fields, Scene& scene) {
     SceneValue const& size = fields.Get("size");
-    ReadFloats(size, "size", 2, "[width, height]");
-    scene.width = ReadInt(size.items[0], "size: width", 1, kMaxSide);
-    scene.height = ReadInt(size.items[1], "size: height", 1, kMaxSide);
+    ReadFloats(size, 2, "[width, height]");
+    scene.width = ReadInt(size.items[0], 1, kMaxSide);
+    scene.height = ReadInt(size.items[1], 1, kMaxSide);
 }
 
 Scene ReadScene(SceneValue const& root, std::string const& folder) {
-    SceneFields fields(root, "a scene");
+    SceneFields fields(root);
     Scene scene;
     ReadSize(fields, scene);
-    if (SceneValue const* const value = fields.Find("about")) scene.about = ReadText(*value, "about");
-    if (SceneValue const* const value = fields.Find("background"))
-        scene.background = ReadColor(*value, "background");
+    if (SceneValue const* const value = fields.Find("about")) scene.about = ReadText(*value);
+    if (SceneValue const* const value = fields.Find("background")) scene.background = ReadColor(*value);
     auto const content = std::make_shared<Content>();
     if (SceneValue const* const value = fields.Find("bitmaps")) ReadBitmaps(*value, folder, *content);
     if (SceneValue const* const value = fields.Find("paints")) ReadPaints(*value, content->names.paints);
-    content->steps = ReadSteps(fields.Get("operations"), "operations", content->names);
+    content->steps = ReadSteps(fields.Get("operations"), content->names);
     fields.CheckAll();
     scene.draw = [content](IMKCanvas& canvas, SceneStage& stage) { content->Draw(canvas, stage); };
     return scene;
 }
 
-std::string ReadWholeFile(std::string const& path) {
+constexpr char kInputName[] = "standard input";
+
+std::string ReadWholeFile(std::string const& path, std::string const& name) {
     std::error_code error;
-    if (fs::is_directory(path, error)) throw SceneError(path + " is a folder; name a scene's file");
+    if (fs::is_directory(path, error)) throw SceneError(name + " is a folder; name a scene's file");
     std::ifstream file(path, std::ios::binary);
-    if (!file) throw SceneError("cannot read " + path + ": " + std::strerror(errno));
+    if (!file) throw SceneError("cannot read " + name + ": " + std::strerror(errno));
     std::string text;
     char block[65536];
     while (file.read(block, sizeof(block)) || file.gcount() > 0) {
         text.append(block, static_cast<std::size_t>(file.gcount()));
         if (text.size() > kMaxFileBytes)
-            throw SceneError(path + " is larger than " + std::to_string(kMaxFileBytes >> 20) + " MiB");
+            throw SceneError(name + " is larger than " + std::to_string(kMaxFileBytes >> 20) + " MiB");
     }
     return text;
+}
+
+std::string AtPlace(std::string const& name, int line, int column) {
+    return name + ':' + std::to_string(line) + ':' + std::to_string(column) + ": ";
+}
+
+SceneValue ParseNamed(std::string_view text, std::string const& name) {
+    try {
+        return ParseSceneText(text);
+    } catch (SceneTextError const& error) {
+        throw SceneError(AtPlace(name, error.GetLine(), error.GetColumn()) + error.what());
+    }
 }
 
 } // namespace
 
 Scene ParseScene(std::string_view text, std::string const& name, std::string const& folder) {
+    SceneValue const root = ParseNamed(text, name);
     try {
-        return ReadScene(ParseSceneText(text), folder);
-    } catch (SceneLineError const& error) {
-        throw SceneError(name + ":" + std::to_string(error.GetLine()) + ": " + error.what());
+        return ReadScene(root, folder);
+    } catch (SceneValueError const& error) {
+        SceneValue const& value = error.GetValue();
+        throw SceneError(AtPlace(name, value.line, value.column) + FindPath(root, value) + error.what());
     }
 }
 
 Scene LoadScene(std::string const& path) {
+    if (path == "-") return ParseScene(ReadWholeFile("/dev/stdin", kInputName), kInputName, "");
     fs::path const file(path);
-    Scene scene = ParseScene(ReadWholeFile(path), path, file.parent_path().string());
+    Scene scene = ParseScene(ReadWholeFile(path, path), path, file.parent_path().string());
     scene.name = file.stem().string();
     return scene;
 }

@@ -1,6 +1,6 @@
 // SceneFile.h: scenes out of JSON. docs/scene-format.md describes the format.
 // Everything is checked, and images are decoded, before anything is drawn.
-// Fails: throws SceneError: "file:line: what is wrong and what was expected".
+// Fails: throws SceneError: "file:line:column: operations[3].DrawRect.rect must be ..., not ...".
 #pragma once
 
 #include "scenes/Scene.h"
@@ -10,7 +10,8 @@
 
 namespace Moka::Scenes {
 
-// The scene's name is the file's, without folder and extension.
+// The scene's name is the file's, without folder and extension. "-" is standard input; images then lie relative
+// to the current folder.
 Scene LoadScene(std::string const& path);
 
 // name stands for the file in messages; images lie relative to folder.

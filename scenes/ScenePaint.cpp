@@ -29,40 +29,38 @@ std::vector<std::string> const kStyles{"Fill", "FillAndStroke", "Stroke"};
 std::vector<std::string> const kCaps{"Butt", "Round", "Square"};
 std::vector<std::string> const kTileModes{"Default", "Clamp", "Mirror", "Repeat"};
 
-MKPaint const& FindPaint(SceneValue const& value, std::string const& what, NamedPaints const& named) {
-    auto const found = named.find(ReadText(value, what));
+MKPaint const& FindPaint(SceneValue const& value, NamedPaints const& named) {
+    auto const found = named.find(ReadText(value));
     if (found != named.end()) return found->second;
     std::string names;
     for (auto const& [name, paint] : named) names += (names.empty() ? "" : ", ") + name;
-    ThrowExpected(value, what, names.empty() ? "described under \"paints\"" : "one of " + names);
+    ThrowExpected(value, names.empty() ? "described under \"paints\"" : "one of " + names);
 }
 
 template <class Enum>
-Enum ReadNumbered(SceneValue const& value, std::string const& what, std::vector<std::string> const& names) {
-    return static_cast<Enum>(ReadEnum(value, what, names));
+Enum ReadNumbered(SceneValue const& value, std::vector<std::string> const& names) {
+    return static_cast<Enum>(ReadEnum(value, names));
 }
 
 void ReadColors(SceneFields& fields, MKPaint& paint) {
     if (SceneValue const* const value = fields.Find("color")) {
-        Vector4<float> const c = ReadColor(*value, fields.Name("color"));
+        Vector4<float> const c = ReadColor(*value);
         paint.SetColor(c.x, c.y, c.z, c.w);
     }
-    if (SceneValue const* const value = fields.Find("alpha"))
-        paint.SetAlpha(ReadFloat(*value, fields.Name("alpha")));
+    if (SceneValue const* const value = fields.Find("alpha")) paint.SetAlpha(ReadFloat(*value));
     if (SceneValue const* const value = fields.Find("tintColor")) {
-        Vector4<float> const c = ReadColor(*value, fields.Name("tintColor"));
+        Vector4<float> const c = ReadColor(*value);
         paint.SetTintColor(c.x, c.y, c.z, c.w);
     }
     if (SceneValue const* const value = fields.Find("xfermode"))
-        paint.SetXFermode(ReadNumbered<MKPaint::XFermode>(*value, fields.Name("xfermode"), kXFermodes));
+        paint.SetXFermode(ReadNumbered<MKPaint::XFermode>(*value, kXFermodes));
 }
 
 void ReadDashes(SceneFields& fields, MKPaint& paint) {
     SceneValue const* const value = fields.Find("dashedLinePattern");
     if (!value) return;
     bool const isShort = value->items.size() == 2;
-    std::vector<float> const n = ReadFloats(*value, fields.Name("dashedLinePattern"), isShort ? 2 : 4,
-                                            "[dash, gap] or [dash, gap, dash, gap]");
+    std::vector<float> const n = ReadFloats(*value, isShort ? 2 : 4, "[dash, gap] or [dash, gap, dash, gap]");
     if (isShort)
         paint.SetDashedLinePattern(Vector2<float>{n[0], n[1]});
     else
@@ -71,22 +69,19 @@ void ReadDashes(SceneFields& fields, MKPaint& paint) {
 
 void ReadStroke(SceneFields& fields, MKPaint& paint) {
     if (SceneValue const* const value = fields.Find("style"))
-        paint.SetStyle(ReadNumbered<MKPaint::Style>(*value, fields.Name("style"), kStyles));
-    if (SceneValue const* const value = fields.Find("lineWidth"))
-        paint.SetLineWidth(ReadFloat(*value, fields.Name("lineWidth")));
-    if (SceneValue const* const value = fields.Find("antiAliasing"))
-        paint.SetAntiAliasing(ReadBool(*value, fields.Name("antiAliasing")));
+        paint.SetStyle(ReadNumbered<MKPaint::Style>(*value, kStyles));
+    if (SceneValue const* const value = fields.Find("lineWidth")) paint.SetLineWidth(ReadFloat(*value));
+    if (SceneValue const* const value = fields.Find("antiAliasing")) paint.SetAntiAliasing(ReadBool(*value));
     if (SceneValue const* const value = fields.Find("lineCapType"))
-        paint.SetLineCapType(ReadNumbered<MKPaint::LineCapType>(*value, fields.Name("lineCapType"), kCaps));
+        paint.SetLineCapType(ReadNumbered<MKPaint::LineCapType>(*value, kCaps));
     ReadDashes(fields, paint);
 }
 
 void ReadTileMode(SceneFields& fields, MKPaint& paint) {
     SceneValue const* const value = fields.Find("tileMode");
     if (!value) return;
-    std::string const what = fields.Name("tileMode");
     auto const read = [&](SceneValue const& mode) {
-        return ReadNumbered<MKPaint::TileMode>(mode, what, kTileModes);
+        return ReadNumbered<MKPaint::TileMode>(mode, kTileModes);
     };
     if (value->kind == Kind::List && value->items.size() == 2)
         paint.SetTileMode(read(value->items[0]), read(value->items[1]));
@@ -96,13 +91,12 @@ void ReadTileMode(SceneFields& fields, MKPaint& paint) {
 
 } // namespace
 
-MKPaint ReadPaint(SceneValue const& value, std::string const& what, NamedPaints const& named) {
-    if (value.kind == Kind::Text) return FindPaint(value, what, named);
-    if (value.kind != Kind::Object) ThrowExpected(value, what, "a paint, { ... }, or the name of one");
-    SceneFields fields(value, what);
+MKPaint ReadPaint(SceneValue const& value, NamedPaints const& named) {
+    if (value.kind == Kind::Text) return FindPaint(value, named);
+    if (value.kind != Kind::Object) ThrowExpected(value, "a paint, { ... }, or the name of one");
+    SceneFields fields(value);
     MKPaint paint;
-    if (SceneValue const* const base = fields.Find("base"))
-        paint = FindPaint(*base, fields.Name("base"), named);
+    if (SceneValue const* const base = fields.Find("base")) paint = FindPaint(*base, named);
     ReadColors(fields, paint);
     ReadStroke(fields, paint);
     ReadTileMode(fields, paint);

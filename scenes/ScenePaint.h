@@ -12,6 +12,6 @@ namespace Moka::Scenes {
 using NamedPaints = std::map<std::string, MKPaint>;
 
 // A name out of those given, or an object; "base" in it names the paint that it changes.
-MKPaint ReadPaint(SceneValue const& value, std::string const& what, NamedPaints const& named);
+MKPaint ReadPaint(SceneValue const& value, NamedPaints const& named);
 
 } // namespace Moka::Scenes

@@ -13,22 +13,19 @@ using Kind = SceneValue::Kind;
 
 constexpr int kMaxRepeat = 100'000;
 
-void CheckCount(long long count, int line) {
+void CheckCount(long long count, SceneValue const& value) {
     if (count > kMaxOperations)
-        throw SceneLineError(line, "a scene may have " + std::to_string(kMaxOperations) +
-                                       " operations, repetitions and batches counted one by one");
+        throw SceneValueError(value, ": a scene may have " + std::to_string(kMaxOperations) +
+                                         " operations, repetitions and batches counted one by one");
 }
 
 // Moves, turns and scales what follows: the last comes first to a point, as with the canvas's Pre operations.
 struct Placement {
     Placement() = default;
     explicit Placement(SceneFields& fields) {
-        if (SceneValue const* const value = fields.Find("translate"))
-            translate = ReadPoint(*value, fields.Name("translate"));
-        if (SceneValue const* const value = fields.Find("rotate"))
-            rotate = ReadFloat(*value, fields.Name("rotate"));
-        if (SceneValue const* const value = fields.Find("scale"))
-            scale = ReadPoint(*value, fields.Name("scale"));
+        if (SceneValue const* const value = fields.Find("translate")) translate = ReadPoint(*value);
+        if (SceneValue const* const value = fields.Find("rotate")) rotate = ReadFloat(*value);
+        if (SceneValue const* const value = fields.Find("scale")) scale = ReadPoint(*value);
     }
 
     void Apply(IMKCanvas& canvas) const {
@@ -71,15 +68,15 @@ private:
     }
 };
 
-Rect ReadClip(SceneValue const& value, std::string const& what) {
-    std::vector<float> const n = ReadFloats(value, what, 4, "[x, y, width, height]");
-    auto const at = [&](std::size_t i) { return ReadInt(value.items[i], what, -1'000'000, 1'000'000); };
+Rect ReadClip(SceneValue const& value) {
+    std::vector<float> const n = ReadFloats(value, 4, "[x, y, width, height]");
+    auto const at = [&](std::size_t i) { return ReadInt(value.items[i], -1'000'000, 1'000'000); };
     return {at(0), at(1), at(0) + at(2), at(1) + at(3)};
 }
 
 void ReadRepeat(SceneValue const& value, Group& group) {
-    SceneFields fields(value, "repeat");
-    group.repeat = ReadInt(fields.Get("count"), fields.Name("count"), 1, kMaxRepeat);
+    SceneFields fields(value);
+    group.repeat = ReadInt(fields.Get("count"), 1, kMaxRepeat);
     group.advance = Placement(fields);
     fields.CheckAll();
 }
@@ -87,12 +84,10 @@ void ReadRepeat(SceneValue const& value, Group& group) {
 SceneOperation ReadGroup(SceneFields& fields, SceneNames const& names) {
     auto const group = std::make_shared<Group>();
     group->placement = Placement(fields);
-    if (SceneValue const* const value = fields.Find("matrix"))
-        group->matrix = ReadMatrix(*value, fields.Name("matrix"));
-    if (SceneValue const* const value = fields.Find("clip"))
-        group->clip = ReadClip(*value, fields.Name("clip"));
+    if (SceneValue const* const value = fields.Find("matrix")) group->matrix = ReadMatrix(*value);
+    if (SceneValue const* const value = fields.Find("clip")) group->clip = ReadClip(*value);
     if (SceneValue const* const value = fields.Find("repeat")) ReadRepeat(*value, *group);
-    group->content = ReadSteps(fields.Get("operations"), fields.Name("operations"), names);
+    group->content = ReadSteps(fields.Get("operations"), names);
     return {[group](IMKCanvas& canvas, SceneBitmaps const& bitmaps) { group->Play(canvas, bitmaps); },
             // What is empty takes time, too, when it is repeated.
             std::max(1LL, group->content.count) * group->repeat};
@@ -116,13 +111,12 @@ std::string ListOperations() {
 
 SceneOperation ReadOperation(SceneValue const& value, SceneNames const& names) {
     if (value.kind != Kind::Object || value.keys.size() != 1)
-        ThrowExpected(value, "an operation", "an object with one name, as {\"DrawCircle\": { ... }}");
+        ThrowExpected(value, "an object with one name, as {\"DrawCircle\": { ... }}");
     std::string const& name = value.keys.front();
     SceneOperationReader const reader = FindReader(name);
     if (!reader)
-        throw SceneLineError(value.items.front().line,
-                             "there is no operation \"" + name + "\"; there are " + ListOperations());
-    SceneFields fields(value.items.front(), name);
+        throw SceneValueError(value.items.front(), " is no operation; there are " + ListOperations());
+    SceneFields fields(value.items.front());
     SceneOperation operation = reader(fields, names);
     fields.CheckAll();
     return operation;
@@ -130,13 +124,13 @@ SceneOperation ReadOperation(SceneValue const& value, SceneNames const& names) {
 
 } // namespace
 
-SceneSteps ReadSteps(SceneValue const& value, std::string const& what, SceneNames const& names) {
-    if (value.kind != Kind::List) ThrowExpected(value, what, "a list of operations");
+SceneSteps ReadSteps(SceneValue const& value, SceneNames const& names) {
+    if (value.kind != Kind::List) ThrowExpected(value, "a list of operations");
     SceneSteps result;
     for (SceneValue const& item : value.items) {
         SceneOperation operation = ReadOperation(item, names);
         result.count += std::max(1LL, operation.count);
-        CheckCount(result.count, item.line);
+        CheckCount(result.count, item);
         result.steps.push_back(std::move(operation.step));
     }
     return result;

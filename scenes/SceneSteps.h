@@ -48,6 +48,6 @@ SceneOperationTable const& GetDrawingOperations();
 SceneOperationTable const& GetStateOperations();
 
 // value is a list of operations, groups among them.
-SceneSteps ReadSteps(SceneValue const& value, std::string const& what, SceneNames const& names);
+SceneSteps ReadSteps(SceneValue const& value, SceneNames const& names);
 
 } // namespace Moka::Scenes

@@ -7,22 +7,60 @@
 #include <cmath>
 #include <cstdint>
 #include <cstdio>
+#include <cstring>
 #include <iterator>
 #include <nlohmann/json.hpp>
 
 namespace Moka::Scenes {
 namespace {
 
-// The parser tells no lines, so what it has read is counted here.
-struct Position {
-    char const* at;
-    char const* begin;
-    int line = 1; // of the character last read
+struct Place {
+    int line = 1;
+    int column = 0;
+};
+
+// The parser tells no places, so what it reads is followed here: where the last character is, and where the
+// value or key began that it belongs to. A text begins at its first quote, a number or a word at its first
+// character.
+class Position {
+public:
+    explicit Position(std::string_view text) : mAt(text.data()) {}
+
+    char const* GetNext() const { return mAt; }
+    Place const& GetLast() const { return mLast; }
+    Place const& GetToken() const { return mToken; }
 
     void Advance() {
-        if (at != begin && at[-1] == '\n') ++line;
-        ++at;
+        char const c = *mAt++;
+        // A line break belongs to the line that it ends.
+        if (mIsAfterBreak) mLast = {mLast.line + 1, 0};
+        mIsAfterBreak = c == '\n';
+        bool const isContinued = (static_cast<unsigned char>(c) & 0xC0) == 0x80; // within a UTF-8 character
+        if (!isContinued) ++mLast.column;
+        mIsInText ? FollowText(c) : FollowStructure(c);
     }
+
+private:
+    void FollowText(char c) {
+        if (!mIsEscaped && c == '"') mIsInText = false;
+        mIsEscaped = !mIsEscaped && c == '\\';
+    }
+
+    void FollowStructure(char c) {
+        bool const isBetween = std::strchr(" \t\r\n,:]}", c) != nullptr;
+        bool const isOpening = c == '{' || c == '[' || c == '"';
+        if (isOpening || (!isBetween && !mIsInWord)) mToken = mLast;
+        mIsInWord = !isBetween && !isOpening;
+        mIsInText = c == '"';
+    }
+
+    char const* mAt;
+    Place mLast;
+    Place mToken;
+    bool mIsAfterBreak = false;
+    bool mIsInText = false;
+    bool mIsEscaped = false;
+    bool mIsInWord = false;
 };
 
 class CountingIterator {
@@ -35,14 +73,14 @@ public:
 
     CountingIterator(Position* position, char const* end) : mPosition(position), mEnd(end) {}
 
-    char const& operator*() const { return *mPosition->at; }
+    char const& operator*() const { return *mPosition->GetNext(); }
     CountingIterator& operator++() {
         mPosition->Advance();
         return *this;
     }
     // Only ever compared with the end.
     friend bool operator==(CountingIterator const& a, CountingIterator const&) {
-        return a.mPosition->at == a.mEnd;
+        return a.mPosition->GetNext() == a.mEnd;
     }
     friend bool operator!=(CountingIterator const& a, CountingIterator const& b) { return !(a == b); }
 
@@ -79,7 +117,7 @@ public:
     bool key(string_t& name) override {
         std::vector<std::string>& keys = mOpen.back()->keys;
         if (std::find(keys.begin(), keys.end(), name) != keys.end())
-            throw SceneLineError(mPosition.line, "\"" + name + "\" is given twice");
+            Throw(mPosition.GetToken(), "\"" + name + "\" is given twice");
         keys.push_back(name);
         return true;
     }
@@ -87,27 +125,31 @@ public:
     bool parse_error(std::size_t, std::string const&, nlohmann::json::exception const& error) override {
         // What comes before is the parser's name of the error and its own count of lines.
         std::string const text = error.what();
-        std::size_t at = text.find("syntax error");
-        if (at == std::string::npos) at = std::min(text.size(), text.find("] ") + 2);
-        throw SceneLineError(mPosition.line, "this is no JSON: " + text.substr(at));
+        std::size_t const syntax = text.find("syntax error");
+        bool const isSyntax = syntax != std::string::npos;
+        std::size_t const at = isSyntax ? syntax : std::min(text.size(), text.find("] ") + 2);
+        // What is too large is a number that has been read past its end.
+        Throw(isSyntax ? mPosition.GetLast() : mPosition.GetToken(), "this is no JSON: " + text.substr(at));
     }
 
 private:
-    // The parser reads one character past a number. It is a line break at most, which does not count until
-    // the next one is read.
+    [[noreturn]] static void Throw(Place const& place, std::string const& message) {
+        throw SceneTextError(place.line, std::max(place.column, 1), message);
+    }
+
     SceneValue& Add(SceneValue::Kind kind) {
         if (++mCount > kMaxValues)
-            throw SceneLineError(mPosition.line, "more than " + std::to_string(kMaxValues) + " values");
+            Throw(mPosition.GetToken(), "more than " + std::to_string(kMaxValues) + " values");
         SceneValue* value = &mRoot;
         if (!mOpen.empty()) value = &mOpen.back()->items.emplace_back();
         value->kind = kind;
-        value->line = mPosition.line;
+        value->line = mPosition.GetToken().line;
+        value->column = mPosition.GetToken().column;
         return *value;
     }
 
     bool AddNumber(double number) {
-        if (!(std::abs(number) <= double{FLT_MAX}))
-            throw SceneLineError(mPosition.line, "a number is too large");
+        if (!(std::abs(number) <= double{FLT_MAX})) Throw(mPosition.GetToken(), "a number is too large");
         Add(SceneValue::Kind::Number).number = number;
         return true;
     }
@@ -115,8 +157,7 @@ private:
     bool Open(SceneValue::Kind kind) {
         SceneValue& value = Add(kind);
         if (mOpen.size() == static_cast<std::size_t>(kMaxNesting))
-            throw SceneLineError(mPosition.line,
-                                 "nested more than " + std::to_string(kMaxNesting) + " levels deep");
+            Throw(mPosition.GetToken(), "nested more than " + std::to_string(kMaxNesting) + " levels deep");
         // Stays where it is while it is open: its neighbours come after it is closed.
         mOpen.push_back(&value);
         return true;
@@ -136,7 +177,31 @@ std::string DescribeNumber(double number) {
     return text;
 }
 
+std::string Step(SceneValue const& parent, std::size_t index) {
+    if (parent.kind == SceneValue::Kind::List) return '[' + std::to_string(index) + ']';
+    std::string const& key = parent.keys[index];
+    bool const isPlain = !key.empty() && key.find_first_of(".[]\" ") == std::string::npos;
+    return isPlain ? '.' + key : "[\"" + key + "\"]";
+}
+
+bool FindSteps(SceneValue const& from, SceneValue const& value, std::string& path) {
+    if (&from == &value) return true;
+    for (std::size_t i = 0; i < from.items.size(); ++i) {
+        std::size_t const length = path.size();
+        path += Step(from, i);
+        if (FindSteps(from.items[i], value, path)) return true;
+        path.resize(length);
+    }
+    return false;
+}
+
 } // namespace
+
+std::string FindPath(SceneValue const& root, SceneValue const& value) {
+    std::string path;
+    if (!FindSteps(root, value, path) || path.empty()) return "the scene";
+    return path.front() == '.' ? path.substr(1) : path;
+}
 
 std::string SceneValue::Describe() const {
     switch (kind) {
@@ -157,7 +222,7 @@ std::string SceneValue::Describe() const {
 }
 
 SceneValue ParseSceneText(std::string_view text) {
-    Position position{text.data(), text.data()};
+    Position position(text);
     char const* const end = text.data() + text.size();
     TreeBuilder builder(position);
     nlohmann::json::sax_parse(CountingIterator(&position, end), CountingIterator(&position, end), &builder);

@@ -1,5 +1,5 @@
-// SceneText.h: JSON text as a tree in which every value knows its line.
-// Fails: throws SceneLineError on what is no JSON, a key given twice, numbers that are not finite in single
+// SceneText.h: JSON text as a tree in which every value knows its place.
+// Fails: throws SceneTextError on what is no JSON, a key given twice, numbers that are not finite in single
 //        precision, and on more than the limits below.
 #pragma once
 
@@ -20,7 +20,8 @@ struct SceneValue {
     std::string Describe() const;
 
     Kind kind = Kind::Null;
-    int line = 0;
+    int line = 0; // of its first character, both from 1; a column is a character
+    int column = 0;
     double number = 0; // of a boolean, 0 or 1
     std::string text;
     std::vector<std::string> keys; // of an object, one for each item
@@ -28,5 +29,8 @@ struct SceneValue {
 };
 
 SceneValue ParseSceneText(std::string_view text);
+
+// The way from root to a value in its tree: "operations[3].DrawRect.rect"; "the scene" for root itself.
+std::string FindPath(SceneValue const& root, SceneValue const& value);
 
 } // namespace Moka::Scenes

@@ -10,17 +10,19 @@ std::vector<std::string> const kSaveFlags{"SaveAll", "SaveMatrix", "SaveClip"};
 
 int GetEnum(SceneFields& fields, char const* key, std::vector<std::string> const& names, int otherwise) {
     SceneValue const* const value = fields.Find(key);
-    return value ? ReadEnum(*value, fields.Name(key), names) : otherwise;
+    return value ? ReadEnum(*value, names) : otherwise;
 }
 
 SceneOperation ReadClear(SceneFields& fields, SceneNames const&) {
-    return {[c = ReadColor(fields.Get("color"), fields.Name("color"))](
-                IMKCanvas& canvas, SceneBitmaps const&) { canvas.Clear(c.x, c.y, c.z, c.w); }};
+    return {[c = ReadColor(fields.Get("color"))](IMKCanvas& canvas, SceneBitmaps const&) {
+        canvas.Clear(c.x, c.y, c.z, c.w);
+    }};
 }
 
 SceneOperation ReadClearAll(SceneFields& fields, SceneNames const&) {
-    return {[c = ReadColor(fields.Get("color"), fields.Name("color"))](
-                IMKCanvas& canvas, SceneBitmaps const&) { canvas.ClearAll(c.x, c.y, c.z, c.w); }};
+    return {[c = ReadColor(fields.Get("color"))](IMKCanvas& canvas, SceneBitmaps const&) {
+        canvas.ClearAll(c.x, c.y, c.z, c.w);
+    }};
 }
 
 SceneOperation ReadSave(SceneFields& fields, SceneNames const&) {
@@ -32,7 +34,7 @@ SceneOperation ReadSave(SceneFields& fields, SceneNames const&) {
 
 SceneOperation ReadRestore(SceneFields& fields, SceneNames const&) {
     SceneValue const* const value = fields.Find("level");
-    int const level = value ? ReadInt(*value, fields.Name("level")) : -1;
+    int const level = value ? ReadInt(*value) : -1;
     return {[level](IMKCanvas& canvas, SceneBitmaps const&) { canvas.Restore(level); }};
 }
 
@@ -51,8 +53,9 @@ using PivotOperation = void (IMKCanvasBase::*)(float, float, float);
 
 template <MatrixOperation operation>
 SceneOperation ReadMatrixOperation(SceneFields& fields, SceneNames const&) {
-    return {[matrix = ReadMatrix(fields.Get("matrix"), fields.Name("matrix"))](
-                IMKCanvas& canvas, SceneBitmaps const&) { (canvas.*operation)(matrix); }};
+    return {[matrix = ReadMatrix(fields.Get("matrix"))](IMKCanvas& canvas, SceneBitmaps const&) {
+        (canvas.*operation)(matrix);
+    }};
 }
 
 template <PairOperation operation>

@@ -10,7 +10,7 @@
 #include "moka/base/String.h"
 #include "moka/graphics/bitmap/IMKBitmap.h"
 #include "moka/graphics/loader/MKBitmapLoader.h"
-#include "moka/graphics/loader/MKBitmapSaveManager.h"
+#include "moka/graphics/task/ITask.h"
 #include "moka/host/RenderThread.h"
 
 #include <chrono>
@@ -18,23 +18,43 @@
 #include <mutex>
 #include <new>
 #include <optional>
-#include <unistd.h>
 #include <utility>
 
 namespace Moka::Tool {
 namespace {
 
-enum class News { None, Loaded, NotLoaded, Saved, NotSaved };
+enum class News { None, Loaded, NotLoaded, Read, Saved, NotSaved };
+
+class Batch;
 
 struct Job {
+    Batch* batch = nullptr;
+
     // What the other threads tell, under the batch's lock.
     News news = News::None;
     RefPtr<IMKBitmap> bitmap;
+    std::string reason; // why it could not be loaded, read back or saved; empty when it could
 
+    std::unique_ptr<unsigned char[]> pixels;    // read back
     std::optional<Interruption::Saving> saving; // from the request to its result
-    std::string gpuError;                       // of the reading back
     std::string error;
 };
+
+// Of uploads, which are looked at by their textures.
+class ForgetErrors final : public ITask {
+public:
+    explicit ForgetErrors(LogCollector& log) : mLog(log) {}
+    void run() override { mLog.TakeOwnError(); }
+
+private:
+    LogCollector& mLog;
+};
+
+// The reason in the library's line, which may not name the file: "cannot read image 'name': reason".
+std::string ReasonIn(std::string line) {
+    std::size_t const end = line.rfind("': ");
+    return end == std::string::npos ? line : line.erase(0, end + 3);
+}
 
 class Batch {
 public:
@@ -43,18 +63,18 @@ public:
 
 private:
     static void OnNews(Handler*, void* batch, int);
-    static void OnSaved(void* batch, String const*, void* job);
-    static void OnSaveFailed(void* batch, String const*, void* job);
+    static void OnRead(Rect const&, void*, void* job);
     MKBitmapLoader::Callback MakeCallback();
 
     void Tell(Job& job, News news);
+    void TellWithReason(int id, News news);
     std::vector<Job*> TakeTold();
     void Drive();
     void StartNext();
     void Start(Job& job);
     void GoOn(Job& job);
+    void ReadBack(Job& job);
     void Save(Job& job);
-    void CheckSaved(Job& job);
     void FailJob(Job& job, std::string const& error);
     void Finish(Job& job);
 
@@ -76,14 +96,13 @@ private:
     MessageLoop mLoop;
     Handler mHandler{OnNews, this};
     std::unique_ptr<RenderThread> mQueue;
-    std::thread::id mRenderThread;
-    MKBitmapSaveManager mSaveManager;
     std::optional<MKBitmapLoader> mLoader; // goes first: what it still calls needs the rest
 };
 
 Batch::Batch(BatchRequest const& request, ConversionEnvironment const& env)
     : mRequest(request), mEnv(env), mJobs(request.files.size()) {
     mTold.reserve(static_cast<std::size_t>(request.inFlight));
+    for (Job& job : mJobs) job.batch = this;
 }
 
 MKBitmapLoader::Callback Batch::MakeCallback() {
@@ -93,16 +112,17 @@ MKBitmapLoader::Callback Batch::MakeCallback() {
         job.bitmap = RefPtr<IMKBitmap>::Share(&bitmap);
         Tell(job, News::Loaded);
     };
-    callback.onLoadError = [this](int id, String const&) {
-        Tell(mJobs[static_cast<std::size_t>(id)], News::NotLoaded);
+    callback.onLoadError = [this](int id, String const&) { TellWithReason(id, News::NotLoaded); };
+    callback.onSave = [this](int id, String const&, void*) {
+        Tell(mJobs[static_cast<std::size_t>(id)], News::Saved);
     };
+    callback.onSaveError = [this](int id, String const&, void*) { TellWithReason(id, News::NotSaved); };
     return callback;
 }
 
 BatchResult Batch::Run() {
     auto const start = std::chrono::steady_clock::now();
     mQueue = StartQueue(mRequest.options, mEnv.log);
-    mQueue->Call([this] { mRenderThread = std::this_thread::get_id(); });
     if (!MKBitmapLoader::startEventLoopBySelf()) throw Failure("not enough memory for the loader's thread");
     MKBitmapLoader::Callback callback = MakeCallback();
     mLoader.emplace("moka", &callback);
@@ -121,7 +141,7 @@ void Batch::Drive() {
     if (mInFlight > 0) mLoop.Run();
 }
 
-// On the loader's thread, or, of a save's result, on the driving one with the save manager's lock held.
+// On the loader's thread or the render thread.
 void Batch::Tell(Job& job, News news) {
     {
         std::lock_guard const lock(mMutex);
@@ -131,12 +151,19 @@ void Batch::Tell(Job& job, News news) {
     mHandler.SendMessage();
 }
 
-void Batch::OnSaved(void* batch, String const*, void* job) {
-    static_cast<Batch*>(batch)->Tell(*static_cast<Job*>(job), News::Saved);
+// The loader has logged the reason on this thread, one request after the other.
+void Batch::TellWithReason(int id, News news) {
+    Job& job = mJobs[static_cast<std::size_t>(id)];
+    job.reason = ReasonIn(mEnv.log.TakeOwnError());
+    Tell(job, news);
 }
 
-void Batch::OnSaveFailed(void* batch, String const*, void* job) {
-    static_cast<Batch*>(batch)->Tell(*static_cast<Job*>(job), News::NotSaved);
+// An error since ForgetErrors is this job's, or that of an upload in between: better one failure too many than
+// a file without its pixels.
+void Batch::OnRead(Rect const&, void*, void* userData) {
+    Job& job = *static_cast<Job*>(userData);
+    job.reason = job.batch->mEnv.log.TakeOwnError();
+    job.batch->Tell(job, News::Read);
 }
 
 void Batch::OnNews(Handler*, void* batch, int) {
@@ -164,7 +191,7 @@ void Batch::Start(Job& job) {
     BatchFile const& file = FileOf(job);
     try {
         ConversionOptions const& options = mRequest.options;
-        CheckWidth(file.input, ReadInfo(file.input, mEnv.log), options, *mQueue);
+        CheckWidth(file.input, ReadInfo(file.input), options, *mQueue);
         String const path(file.input);
         if (!mLoader->RequestLoad(IdOf(job), path, mQueue.get(), options.width, options.height))
             FailJob(job, file.input + ": not enough memory to load it");
@@ -180,17 +207,15 @@ void Batch::GoOn(Job& job) {
     try {
         switch (job.news) {
         case News::Loaded:
+            return ReadBack(job);
+        case News::NotLoaded:
+            return FailJob(job, TellCannot("read", file.input, job.reason));
+        case News::Read:
             return Save(job);
-        case News::NotLoaded: {
-            std::string const error = mEnv.log.GetErrorAbout(file.input);
-            return FailJob(job, error.empty() ? file.input + ": it cannot be read" : error);
-        }
         case News::Saved:
-            return CheckSaved(job);
-        case News::NotSaved: {
-            std::string const error = mEnv.log.GetErrorAbout(file.output);
-            return FailJob(job, file.input + ": " + (error.empty() ? "cannot save " + file.output : error));
-        }
+            return Finish(job);
+        case News::NotSaved:
+            return FailJob(job, file.input + ": " + TellCannot("save", file.output, job.reason));
         case News::None:
             return;
         }
@@ -201,30 +226,27 @@ void Batch::GoOn(Job& job) {
     }
 }
 
+void Batch::ReadBack(Job& job) {
+    Rect const whole = job.bitmap->GetBitmapRect();
+    std::size_t const pixels =
+        static_cast<std::size_t>(whole.GetWidth()) * static_cast<std::size_t>(whole.GetHeight());
+    job.pixels.reset(new (std::nothrow) unsigned char[pixels * 4]);
+    if (!job.pixels) throw Failure(FileOf(job).input + ": not enough memory to read it back");
+    auto* const forget = new (std::nothrow) ForgetErrors(mEnv.log);
+    if (!mQueue->Post(forget)) delete forget;
+    job.bitmap->GetBitmapDataAsync(whole, job.pixels.get(), &job, OnRead);
+}
+
 void Batch::Save(Job& job) {
     BatchFile const& file = FileOf(job);
     RefPtr<IMKBitmap> const bitmap = std::move(job.bitmap);
-    mQueue->WaitForTasks();
     CheckStrips(*bitmap, file.input);
-    // Of uploads, which have been looked at.
-    mEnv.log.TakeErrorOf(mRenderThread);
-
+    if (!job.reason.empty()) throw Failure(file.input + ": cannot be read back from the GPU: " + job.reason);
     job.saving.emplace(mEnv.interruption);
-    MKBitmapSaveManager::SaveCallback callback{OnSaved, OnSaveFailed, this, &job};
-    if (!mSaveManager.RequestSave(IdOf(job), String(file.output), *bitmap, &callback,
-                                  mRequest.options.quality))
-        throw Failure(file.input + ": not enough memory to read it back");
-    // The GPU's errors do not tell which bitmap they are about. That of an upload in between is taken for one
-    // of reading back: better one failure too many than a file without its pixels.
-    mQueue->WaitForTasks();
-    job.gpuError = mEnv.log.TakeErrorOf(mRenderThread);
-}
-
-// A bitmap that could not be read back has been saved all the same, without its pixels.
-void Batch::CheckSaved(Job& job) {
-    if (job.gpuError.empty()) return Finish(job);
-    unlink(FileOf(job).output.c_str());
-    FailJob(job, FileOf(job).input + ": cannot be read back from the GPU: " + job.gpuError);
+    if (!mLoader->RequestSave(IdOf(job), String(file.output), job.pixels.get(), bitmap->GetWidth(),
+                              bitmap->GetHeight(), nullptr, mRequest.options.quality))
+        throw Failure(file.input + ": not enough memory to save it");
+    static_cast<void>(job.pixels.release()); // the loader's now
 }
 
 void Batch::FailJob(Job& job, std::string const& error) {
@@ -234,6 +256,8 @@ void Batch::FailJob(Job& job, std::string const& error) {
 
 void Batch::Finish(Job& job) {
     job.saving.reset();
+    job.bitmap = {};
+    job.pixels.reset();
     --mInFlight;
     mEnv.progress.SetCount(++mDone, static_cast<int>(mJobs.size()));
 }

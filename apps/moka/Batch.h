@@ -1,9 +1,8 @@
 // Batch: many images through the GPU, several at a time: the loader's thread decodes and encodes, the render
 // thread uploads and reads back, the calling thread drives them.
 // Thread:  once in a process, on a thread without a message loop. The loader's thread sleeps on afterwards.
-// Fails:   a file that cannot be converted stops no other; its output then is what it was before, unless the
-//          GPU failed at reading it back: that is found out late, and the output is gone. Throws Failure when
-//          nothing can be converted at all.
+// Fails:   a file that cannot be converted stops no other; its output then is what it was before. Throws
+//          Failure when nothing can be converted at all.
 // Memory:  no more than the given number of images, each in at most two copies.
 #pragma once
 

@@ -26,12 +26,25 @@ void CheckUpload(IMKBitmap& bitmap, std::string const& name, LogCollector const&
     CheckStrips(bitmap, name);
 }
 
-BitmapPtr Upload(ConversionRequest const& request, RenderThread& queue, ConversionEnvironment const& env) {
+// The pixels, which are freed behind the upload.
+BitmapPtr Decode(ConversionRequest const& request, RenderThread& queue) {
     String const path(request.input);
+    ConversionOptions const& options = request.options;
+    std::string reason;
+    std::unique_ptr<Bitmap> const decoded(
+        options.width != 0 ? BitmapFactory::CreateBitmap(&path, options.width, options.height, &reason)
+                           : BitmapFactory::CreateBitmapForGraphics(&path, &reason));
+    if (!decoded) throw Failure(TellCannot("read", request.input, reason));
+    BitmapPtr bitmap = BitmapPtr::Adopt(MKGraphicsFactory::CreateBitmap(
+        &queue, decoded->GetWidth(), decoded->GetHeight(), decoded->GetBuffer(), true, 1, false));
+    if (!bitmap) throw Failure(request.input + ": not enough memory to load it");
+    decoded->SetDeleteBuffer(false);
+    return bitmap;
+}
+
+BitmapPtr Upload(ConversionRequest const& request, RenderThread& queue, ConversionEnvironment const& env) {
     env.progress.SetStage("decode");
-    BitmapPtr bitmap = BitmapPtr::Adopt(
-        MKGraphicsFactory::CreateBitmap(&queue, &path, request.options.width, request.options.height, 1));
-    if (!bitmap) env.log.Throw("cannot load " + request.input);
+    BitmapPtr bitmap = Decode(request, queue);
     env.progress.SetStage("upload");
     queue.WaitForTasks();
     CheckUpload(*bitmap, request.input, env.log);
@@ -58,15 +71,16 @@ void Save(Bitmap const& image, ConversionRequest const& request, ConversionEnvir
     String const path(request.output);
     env.progress.SetStage("encode");
     Interruption::Saving const saving(env.interruption);
-    if (!BitmapFactory::SaveBitmap(&image, &path, request.options.quality))
-        env.log.Throw("cannot save " + request.output);
+    std::string reason;
+    if (!BitmapFactory::SaveBitmap(&image, &path, request.options.quality, &reason))
+        throw Failure(TellCannot("save", request.output, reason));
 }
 
 } // namespace
 
 ConversionResult Convert(ConversionRequest const& request, ConversionEnvironment const& env) {
     ConversionResult result;
-    result.input = ReadInfo(request.input, env.log);
+    result.input = ReadInfo(request.input);
     Bitmap image;
     {
         std::unique_ptr<RenderThread> const queue = StartQueue(request.options, env.log);
@@ -78,7 +92,7 @@ ConversionResult Convert(ConversionRequest const& request, ConversionEnvironment
         result.renderer = queue->GetContextInfo().renderer;
     }
     Save(image, request, env);
-    result.output = ReadInfo(request.output, env.log);
+    result.output = ReadInfo(request.output);
     return result;
 }
 

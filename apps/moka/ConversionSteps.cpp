@@ -21,12 +21,12 @@ std::string TellLimit(RenderThread const& queue) {
 
 } // namespace
 
-ImageInfo ReadInfo(std::string const& path, LogCollector const& log) {
+ImageInfo ReadInfo(std::string const& path) {
     String const text(path);
     ImageInfo info;
-    if (BitmapFactory::GetImageInfo(&text, &info)) return info;
-    std::string const error = log.GetErrorAbout(path);
-    throw Failure(error.empty() ? "cannot read " + path : error);
+    std::string reason;
+    if (BitmapFactory::GetImageInfo(&text, &info, &reason)) return info;
+    throw Failure(TellCannot("read", path, reason));
 }
 
 std::unique_ptr<RenderThread> StartQueue(ConversionOptions const& options, LogCollector& log) {

@@ -31,7 +31,7 @@ struct ConversionEnvironment {
     Interruption& interruption;
 };
 
-ImageInfo ReadInfo(std::string const& path, LogCollector const& log);
+ImageInfo ReadInfo(std::string const& path);
 
 // Also refuses a size that no texture of the device can be made for. Clears the log.
 std::unique_ptr<RenderThread> StartQueue(ConversionOptions const& options, LogCollector& log);

@@ -29,13 +29,11 @@ struct DrawOptions {
     std::string output;
 };
 
-Scenes::Scene Load(std::string const& path, LogCollector const& log) {
+Scenes::Scene Load(std::string const& path) {
     try {
         return Scenes::LoadScene(path);
     } catch (Scenes::SceneError const& error) {
-        // The log has the reason when it was an image that could not be read.
-        std::string const reason = log.GetError();
-        throw Failure(reason.empty() ? error.what() : std::string(error.what()) + ": " + reason);
+        throw Failure(error.what());
     }
 }
 
@@ -47,11 +45,11 @@ void RunDraw(DrawOptions const& options) {
         LogCollector log(false);
         Progress progress(true);
         progress.SetStage("read the scene");
-        Scenes::Scene const scene = Load(options.input, log);
+        Scenes::Scene const scene = Load(options.input);
         progress.SetStage("draw");
         picture = DrawOnGpu(scene, *StartForScene({}, log), log);
         progress.SetStage("encode");
-        SavePicture(picture, options.output, log, interruption);
+        SavePicture(picture, options.output, interruption);
     }
     std::printf("%s -> %s (%dx%d)\n", options.input.c_str(), options.output.c_str(), picture.width,
                 picture.height);

@@ -21,6 +21,9 @@ private:
     int mStatus;
 };
 
+// "cannot read image 'path': reason", or what else the library could not do; without a reason only that.
+std::string TellCannot(char const* action, std::string const& path, std::string const& reason);
+
 // "moka: message" on stderr, as one line whatever is in it.
 void PrintError(std::string const& message);
 

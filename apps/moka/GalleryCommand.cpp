@@ -34,6 +34,7 @@ struct GalleryOptions {
     std::string folder;
     std::vector<std::string> only;
     bool list = false;
+    bool mki = false;
 };
 
 struct Gallery {
@@ -119,12 +120,15 @@ void SavePage(std::string const& page, std::string const& folder, Interruption& 
     throw Failure("cannot write " + path.string());
 }
 
-void SaveAll(Gallery const& gallery, std::string const& folder, LogCollector const& log,
-             Interruption& interruption) {
+std::string GetPath(GalleryOptions const& options, GalleryPicture const& picture) {
+    return (fs::path(options.folder) / (picture.GetName() + (options.mki ? ".mki" : ".png"))).string();
+}
+
+void SaveAll(Gallery const& gallery, GalleryOptions const& options, Interruption& interruption) {
     for (std::size_t i = 0; i < gallery.pictures.size(); ++i)
-        SavePicture(gallery.pixels[i], (fs::path(folder) / (gallery.pictures[i].GetName() + ".png")).string(),
-                    log, interruption);
-    SavePage(MakeGalleryPage(gallery.pictures, gallery.device), folder, interruption);
+        SavePicture(gallery.pixels[i], GetPath(options, gallery.pictures[i]), interruption);
+    if (options.mki) return; // no browser shows them
+    SavePage(MakeGalleryPage(gallery.pictures, gallery.device), options.folder, interruption);
 }
 
 // Everything is drawn before anything is written, so that a failure leaves no half of a gallery.
@@ -143,10 +147,11 @@ void RunGallery(GalleryOptions const& options) {
         DrawAll(gallery, log, progress);
         progress.SetStage("save the pictures");
         MakeFolder(options.folder);
-        SaveAll(gallery, options.folder, log, interruption);
+        SaveAll(gallery, options, interruption);
     }
     for (GalleryPicture const& picture : gallery.pictures)
-        std::printf("%s\n", (fs::path(options.folder) / (picture.GetName() + ".png")).c_str());
+        std::printf("%s\n", GetPath(options, picture).c_str());
+    if (options.mki) return;
     std::printf("%s\n", (fs::path(options.folder) / "index.html").c_str());
 }
 
@@ -162,6 +167,9 @@ void AddGalleryCommand(CLI::App& app) {
         ->type_name("DIR")
         ->check(CLI::Validator(CheckPath, ""));
     command->add_option("--only", options->only, "Only the scenes of these names")->type_name("NAME");
+    command->add_flag(
+        "--mki", options->mki,
+        "Write mki files with the bytes that the GPU holds, to compare drivers; no PNG, no page");
     command->add_flag("--list", options->list, "Tell the names, sizes and sentences of all scenes");
     command->callback([options] { RunGallery(*options); });
 }

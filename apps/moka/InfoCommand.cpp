@@ -21,12 +21,12 @@ struct InfoOptions {
     bool verbose = false;
 };
 
-bool PrintFile(std::string const& file, LogCollector& log) {
+bool PrintFile(std::string const& file) {
     String const path(file);
     ImageInfo info;
-    if (!BitmapFactory::GetImageInfo(&path, &info)) {
-        PrintError(log.GetError());
-        log.Clear();
+    std::string reason;
+    if (!BitmapFactory::GetImageInfo(&path, &info, &reason)) {
+        PrintError(TellCannot("read", file, reason));
         return false;
     }
     unsigned long long const decoded =
@@ -56,9 +56,9 @@ void PrintDevice() {
 void RunInfo(InfoOptions const& options) {
     if (options.files.empty() && !options.device)
         throw Failure(ExitStatus::Usage, "name a file, or ask for --device; see moka info --help");
-    LogCollector log(options.verbose);
+    LogCollector const log(options.verbose);
     bool isAllRead = true;
-    for (std::string const& file : options.files) isAllRead = PrintFile(file, log) && isAllRead;
+    for (std::string const& file : options.files) isAllRead = PrintFile(file) && isAllRead;
     if (options.device) PrintDevice();
     if (!isAllRead) throw Failure("");
 }

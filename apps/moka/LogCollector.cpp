@@ -1,6 +1,7 @@
 #include "apps/moka/LogCollector.h"
 
 #include "apps/moka/Failure.h"
+#include "moka/base/System.h"
 #include "moka/base/log/AndroidLog.h"
 
 #include <algorithm>
@@ -11,15 +12,6 @@ namespace {
 
 constexpr std::size_t kMaxErrors = 300;
 
-// As the library's messages quote it.
-std::string Quote(std::string const& path) {
-    std::string quoted = "'" + path + "'";
-    for (char& c : quoted) {
-        if (static_cast<unsigned char>(c) < ' ' || c == 0x7F) c = '?';
-    }
-    return quoted;
-}
-
 char const* NameOf(int priority) {
     if (priority >= ANDROID_LOG_ERROR) return "error";
     if (priority == ANDROID_LOG_WARN) return "warning";
@@ -29,7 +21,9 @@ char const* NameOf(int priority) {
 } // namespace
 
 LogCollector::LogCollector(bool verbose)
-    : mVerbose(verbose), mPrevious(SetLogSink([this](LogLine const& line) { OnLine(line); })) {}
+    : mVerbose(verbose), mPrevious(SetLogSink([this](LogLine const& line) { OnLine(line); })) {
+    System::SetBuildTypeEngMode(verbose);
+}
 
 LogCollector::~LogCollector() { SetLogSink(mPrevious); }
 
@@ -44,21 +38,13 @@ void LogCollector::Clear() {
     mErrors.clear();
 }
 
-std::string LogCollector::GetErrorAbout(std::string const& path) const {
-    std::string const name = Quote(path);
+std::string LogCollector::TakeOwnError() {
+    auto const isOwn = [own = std::this_thread::get_id()](Error const& error) { return error.thread == own; };
     std::lock_guard const lock(mMutex);
-    auto const found = std::find_if(mErrors.begin(), mErrors.end(), [&](Error const& error) {
-        return error.text.find(name) != std::string::npos;
-    });
-    return found == mErrors.end() ? std::string() : found->text;
-}
-
-std::string LogCollector::TakeErrorOf(std::thread::id thread) {
-    std::lock_guard const lock(mMutex);
-    auto const others = std::stable_partition(mErrors.begin(), mErrors.end(),
-                                              [&](Error const& error) { return error.thread != thread; });
-    std::string const first = others == mErrors.end() ? std::string() : others->text;
-    mErrors.erase(others, mErrors.end());
+    std::string first;
+    auto const found = std::find_if(mErrors.begin(), mErrors.end(), isOwn);
+    if (found != mErrors.end()) first.swap(found->text);
+    mErrors.erase(std::remove_if(found, mErrors.end(), isOwn), mErrors.end());
     return first;
 }
 

@@ -1,6 +1,6 @@
 // LogCollector: keeps the library's log off the terminal for its scope and turns its errors into a Failure.
-// The library reports a failure as a null and an error line, some as the line alone; so whoever used it asks
-// here whether there was one. With several files in work at once, a line belongs to the file that it names.
+// The GPU's failures are error lines alone; so whoever used it asks here whether there was one. With several
+// files in work at once, a line belongs to the file that the thread which logged it was at.
 // Thread:  lines from any thread; asked by any.
 #pragma once
 
@@ -15,7 +15,7 @@ namespace Moka::Tool {
 
 class LogCollector {
 public:
-    // With verbose every line is written to stderr as well.
+    // With verbose every line is written to stderr as well, and names files.
     explicit LogCollector(bool verbose);
     ~LogCollector();
     LogCollector(LogCollector const&) = delete;
@@ -25,10 +25,9 @@ public:
     std::string GetError() const;
     void Clear();
 
-    // The first error about this file, of the last few hundred errors; empty without one.
-    std::string GetErrorAbout(std::string const& path) const;
-    // The first error that this thread logged, of the last few hundred; all of its errors are then forgotten.
-    std::string TakeErrorOf(std::thread::id thread);
+    // The first error that the calling thread logged, of the last few hundred; all of its errors are then
+    // forgotten. Allocates nothing.
+    std::string TakeOwnError();
 
     // Throws the first error, if there is one.
     void ThrowError() const;

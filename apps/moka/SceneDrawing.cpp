@@ -37,15 +37,16 @@ Scenes::Picture DrawOnGpu(Scenes::Scene const& scene, RenderThread& queue, LogCo
     }
 }
 
-void SavePicture(Scenes::Picture const& picture, std::string const& path, LogCollector const& log,
-                 Interruption& interruption) {
+void SavePicture(Scenes::Picture const& picture, std::string const& path, Interruption& interruption) {
     Bitmap image;
     // Only read; the bitmap has no constant form.
     image.Construct(const_cast<unsigned char*>(picture.pixels.data()), picture.width, picture.height,
                     static_cast<int>(picture.GetStride()), Bitmap::kFormatRgba8888, false, false);
     String const name(path);
     Interruption::Saving const saving(interruption);
-    if (!BitmapFactory::SaveBitmap(&image, &name, GetUsualQuality(path))) log.Throw("cannot save " + path);
+    std::string reason;
+    if (!BitmapFactory::SaveBitmap(&image, &name, GetUsualQuality(path), &reason))
+        throw Failure(TellCannot("save", path, reason));
 }
 
 } // namespace Moka::Tool

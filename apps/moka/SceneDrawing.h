@@ -19,7 +19,6 @@ std::unique_ptr<RenderThread> StartForScene(RenderThreadOptions const& options, 
 Scenes::Picture DrawOnGpu(Scenes::Scene const& scene, RenderThread& queue, LogCollector const& log);
 
 // In the format of the extension: JPEG at quality 90, the others with every pixel.
-void SavePicture(Scenes::Picture const& picture, std::string const& path, LogCollector const& log,
-                 Interruption& interruption);
+void SavePicture(Scenes::Picture const& picture, std::string const& path, Interruption& interruption);
 
 } // namespace Moka::Tool

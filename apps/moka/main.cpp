@@ -5,7 +5,6 @@
 #include "apps/moka/Failure.h"
 #include "apps/moka/GalleryCommand.h"
 #include "apps/moka/InfoCommand.h"
-#include "moka/base/System.h"
 #include "moka/base/log/AndroidLog.h"
 #include "moka/base/log/LogSink.h"
 
@@ -68,8 +67,6 @@ int main(int argc, char** argv) {
     std::signal(SIGXFSZ, SIG_IGN);
     // What the library says is collected where it matters. Its threads may say more while the process ends.
     Moka::SetLogPriority(ANDROID_LOG_ERROR);
-    // The person who named a file may read its whole path in messages.
-    Moka::System::SetBuildTypeEngMode(true);
     try {
         return Run(argc, argv);
     } catch (Failure const& failure) {

@@ -58,9 +58,10 @@ public:
     UNCOUNTED explicit Drawing(IGLMsgQueue* queue) : mQueue(queue) {}
 
     UNCOUNTED void Run() {
-        auto const bitmap =
-            RefPtr<IMKBitmap>::Adopt(MKGraphicsFactory::CreateBitmap(mQueue, 256, 256, nullptr, false, 0, false));
-        auto const canvas = RefPtr<IMKCanvas>::Adopt(MKGraphicsFactory::CreateCanvas(mQueue, bitmap.Get(), 0));
+        auto const bitmap = RefPtr<IMKBitmap>::Adopt(
+            MKGraphicsFactory::CreateBitmap(mQueue, 256, 256, nullptr, false, 0, false));
+        auto const canvas =
+            RefPtr<IMKCanvas>::Adopt(MKGraphicsFactory::CreateCanvas(mQueue, bitmap.Get(), 0));
         MKPaint paint;
         for (int i = 0; i < 10; ++i) canvas->DrawRect(RectF(1, 2, 30, 40), &paint);
         RectF const rect(3, 4, 50, 60);

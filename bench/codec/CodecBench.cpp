@@ -1,15 +1,19 @@
 // CodecBench.cpp: how fast image files are read and written, in megapixels a second, and how large they are.
 // Two pictures of 2048 x 2048: a page of sparse pen strokes on nothing, and a smooth picture with some grain.
+// DecodeSrgb and DecodeP3 read the latter with such a profile, beside Decode, which reads it without.
 // Files stand in memory where the system offers that, so that the disk is not what is measured.
 #include "moka/base/Bitmap.h"
 #include "moka/base/BitmapFactory.h"
 #include "moka/base/String.h"
+#include "tests/support/ColorProfiles.h"
 
 #include <algorithm>
 #include <benchmark/benchmark.h>
 #include <cmath>
 #include <cstdint>
 #include <filesystem>
+#include <fstream>
+#include <iterator>
 #include <memory>
 #include <random>
 #include <string>
@@ -136,16 +140,33 @@ void Decode(benchmark::State& state, Picture picture, char const* extension, int
     Report(state, path);
 }
 
+void DecodeProfiled(benchmark::State& state, char const* extension, Moka::Testing::ProfileKind kind) {
+    std::string const path = PathFor(kPhoto, extension, 100);
+    String const text(path);
+    BitmapFactory::SaveBitmap(&GetBitmap(kPhoto), &text, 100);
+    std::ifstream plain(path, std::ios::binary);
+    Moka::Testing::FileBytes const bytes(std::istreambuf_iterator<char>(plain), {});
+    std::string const name = path + ".profiled";
+    Moka::Testing::FileBytes const file =
+        Moka::Testing::EmbedProfile(bytes, Moka::Testing::MakeProfile(kind));
+    std::ofstream(name, std::ios::binary)
+        .write(reinterpret_cast<char const*>(file.data()), static_cast<std::streamsize>(file.size()));
+    String const profiled(name);
+    for (auto _ : state) {
+        std::unique_ptr<Bitmap> const bitmap(BitmapFactory::CreateBitmapForGraphics(&profiled));
+        if (!bitmap) return state.SkipWithError("cannot read");
+        benchmark::DoNotOptimize(bitmap->GetBuffer());
+    }
+    Report(state, name);
+}
+
 int RegisterAll() {
     struct {
         char const* name;
         char const* extension;
         int quality;
-    } const formats[] = {{"png", "png", 100},
-                         {"jpeg90", "jpg", 90},
-                         {"webp80", "webp", 80},
-                         {"webpLossless", "webp", 100},
-                         {"mki", "mki", 100}};
+    } const formats[] = {{"png", "png", 100},    {"jpeg90", "jpg", 90},         {"jpeg100", "jpg", 100},
+                         {"webp80", "webp", 80}, {"webpLossless", "webp", 100}, {"mki", "mki", 100}};
     for (Picture const picture : {kInk, kPhoto}) {
         std::string const kind = picture == kInk ? "/ink/" : "/photo/";
         for (auto const& format : formats) {
@@ -159,6 +180,16 @@ int RegisterAll() {
             add("DecodeTo256", Decode, 256);
             add("DecodeTo1500", Decode, 1500);
         }
+    }
+    using Moka::Testing::ProfileKind;
+    for (char const* const extension : {"png", "jpg", "webp"}) {
+        auto const add = [&](char const* name, ProfileKind kind) {
+            benchmark::RegisterBenchmark((name + std::string("/photo/") + extension + "100").c_str(),
+                                         DecodeProfiled, extension, kind)
+                ->Unit(benchmark::kMillisecond);
+        };
+        add("DecodeSrgb", ProfileKind::Srgb);
+        add("DecodeP3", ProfileKind::DisplayP3);
     }
     return 0;
 }

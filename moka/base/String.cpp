@@ -50,6 +50,27 @@ std::string String::ToUtf8() const {
     return utf8;
 }
 
+String String::FromFileName(std::string const& bytes) {
+    String name;
+    name.mText = detail::Utf16FromFileName(bytes);
+    return name;
+}
+
+std::string String::ToFileName() const {
+    std::string name;
+    char bytes[4];
+    for (std::size_t position = 0; position < mText.size();) {
+        char16_t const unit = mText[position];
+        char32_t const codePoint = detail::NextCodePoint(mText, position);
+        bool const isByte = unit >= 0xdc80 && unit <= 0xdcff;
+        if (isByte)
+            name.push_back(static_cast<char>(unit & 0xff));
+        else
+            name.append(bytes, detail::EncodeUtf8(codePoint, bytes));
+    }
+    return name;
+}
+
 int String::ToUtf8(char* buffer, int maxBytes) const {
     if (!buffer || maxBytes < 0) return -1;
     auto const room = static_cast<std::size_t>(maxBytes);

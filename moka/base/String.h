@@ -38,6 +38,11 @@ public:
 
     std::string ToUtf8() const;
 
+    // Names of files, which a system takes as bytes, whether they are UTF-8 or not. Each byte that is no UTF-8
+    // becomes a lone surrogate, U+DC80 to U+DCFF, and a byte again; all else as with UTF-8.
+    static String FromFileName(std::string const& bytes);
+    std::string ToFileName() const;
+
     // Copies at most maxBytes of UTF-8 into buffer, cut at a character boundary, and terminates it: buffer
     // needs room for maxBytes + 1. Returns the bytes copied, without the terminator; -1 and no change when
     // buffer is null or maxBytes negative.

@@ -3,7 +3,8 @@
 namespace Moka::detail {
 namespace {
 
-constexpr char32_t kReplacement = 0xfffd;
+constexpr char16_t kReplacement = 0xfffd;
+constexpr char32_t kMalformed = 0xffffffff;
 
 // What a first byte promises: the length of the character and the range of the second byte. The ranges that
 // are narrower than 0x80 ... 0xbf keep out overlong forms, surrogates and what lies above U+10FFFF.
@@ -29,13 +30,13 @@ constexpr Lead LeadOf(unsigned char byte) {
 char32_t NextCodePoint(std::string_view utf8, std::size_t& position) {
     auto const first = static_cast<unsigned char>(utf8[position++]);
     Lead lead = LeadOf(first);
-    if (lead.length == 0) return kReplacement;
+    if (lead.length == 0) return kMalformed;
     if (lead.length == 1) return first;
     char32_t codePoint = first & (0x7fU >> lead.length);
     for (std::size_t i = 1; i < lead.length; ++i) {
-        if (position == utf8.size()) return kReplacement;
+        if (position == utf8.size()) return kMalformed;
         auto const byte = static_cast<unsigned char>(utf8[position]);
-        if (byte < lead.secondLow || byte > lead.secondHigh) return kReplacement;
+        if (byte < lead.secondLow || byte > lead.secondHigh) return kMalformed;
         lead.secondLow = 0x80;
         lead.secondHigh = 0xbf;
         codePoint = (codePoint << 6) | (byte & 0x3fU);
@@ -49,12 +50,19 @@ constexpr bool IsLowSurrogate(char16_t unit) { return (unit & 0xfc00) == 0xdc00;
 
 } // namespace
 
-std::u16string Utf16FromUtf8(std::string_view utf8) {
+namespace {
+
+// handleMalformed gets the bytes that begin no character.
+template <class HandleMalformed>
+std::u16string Convert(std::string_view utf8, HandleMalformed const& handleMalformed) {
     std::u16string text;
     text.reserve(utf8.size()); // never too small: no byte makes more than one unit
     for (std::size_t position = 0; position < utf8.size();) {
+        std::size_t const start = position;
         char32_t const codePoint = NextCodePoint(utf8, position);
-        if (codePoint < 0x10000) {
+        if (codePoint == kMalformed) {
+            handleMalformed(text, utf8.substr(start, position - start));
+        } else if (codePoint < 0x10000) {
             text.push_back(static_cast<char16_t>(codePoint));
         } else {
             text.push_back(static_cast<char16_t>(0xd7c0 + (codePoint >> 10)));
@@ -62,6 +70,19 @@ std::u16string Utf16FromUtf8(std::string_view utf8) {
         }
     }
     return text;
+}
+
+} // namespace
+
+std::u16string Utf16FromUtf8(std::string_view utf8) {
+    return Convert(utf8, [](std::u16string& text, std::string_view) { text.push_back(kReplacement); });
+}
+
+std::u16string Utf16FromFileName(std::string_view bytes) {
+    return Convert(bytes, [](std::u16string& text, std::string_view malformed) {
+        for (char const byte : malformed)
+            text.push_back(static_cast<char16_t>(0xdc00 | static_cast<unsigned char>(byte)));
+    });
 }
 
 char32_t NextCodePoint(std::u16string_view text, std::size_t& position) {

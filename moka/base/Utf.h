@@ -9,6 +9,8 @@
 namespace Moka::detail {
 
 std::u16string Utf16FromUtf8(std::string_view utf8);
+// Each byte of what is malformed as U+DC00 and the byte.
+std::u16string Utf16FromFileName(std::string_view bytes);
 
 // The code point at position, which is moved behind it. position is below the length.
 char32_t NextCodePoint(std::u16string_view text, std::size_t& position);

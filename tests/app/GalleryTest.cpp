@@ -81,11 +81,11 @@ TEST_F(GalleryTest, EverySceneIsAPictureOnThePageAndOnDisk) {
 
 // The screen's rows lie the other way round on the GPU, and its clips are counted from its lower border.
 TEST_F(GalleryTest, TheScreenLooksLikeATexture) {
-    RunWell({"gallery", "--out", ".", "--only", "screen", "clips"});
-    EXPECT_THAT(List(), ElementsAre("clips-in-strips.png", "clips.png", "index.html", "screen.png"));
-    RunWell({"draw", std::string(MOKA_SOURCE_FOLDER) + "/scenes/data/screen.json", "-o", "texture.png"});
-    TestImage const screen = Load("screen.png");
-    TestImage const texture = Load("texture.png");
+    RunWell({"gallery", "--mki", "--out", ".", "--only", "screen", "clips"});
+    EXPECT_THAT(List(), ElementsAre("clips-in-strips.mki", "clips.mki", "screen.mki"));
+    RunWell({"draw", std::string(MOKA_SOURCE_FOLDER) + "/scenes/data/screen.json", "-o", "texture.mki"});
+    TestImage const screen = Load("screen.mki");
+    TestImage const texture = Load("texture.mki");
     EXPECT_LE(CompareImages(screen, texture).differingPixels, 12);
 }
 

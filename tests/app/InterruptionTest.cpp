@@ -30,17 +30,17 @@ TestImage MakeNoise(int side) {
 class Terminal {
 public:
     Terminal() : mOwn(posix_openpt(O_RDWR | O_NOCTTY | O_NONBLOCK)) {
-        grantpt(mOwn);
-        unlockpt(mOwn);
-        mOther = open(ptsname(mOwn), O_RDWR | O_NOCTTY);
+        if (mOwn < 0 || grantpt(mOwn) != 0 || unlockpt(mOwn) != 0) return;
+        if (char const* const name = ptsname(mOwn)) mOther = open(name, O_RDWR | O_NOCTTY);
     }
     ~Terminal() {
-        close(mOther);
-        close(mOwn);
+        if (mOther >= 0) close(mOther);
+        if (mOwn >= 0) close(mOwn);
     }
     Terminal(Terminal const&) = delete;
     Terminal& operator=(Terminal const&) = delete;
 
+    // -1 where the system has no terminals to give: a container without /dev/pts.
     int GetFile() const { return mOther; }
 
     std::string const& GetShown() {
@@ -110,7 +110,7 @@ protected:
         Terminal terminal;
         ProcessOptions options;
         options.terminal = terminal.GetFile();
-        ASSERT_GE(options.terminal, 0);
+        if (options.terminal < 0) GTEST_SKIP() << "no terminal can be opened here: is /dev/pts mounted?";
         MokaProcess process(mFolder.string(), arguments, options);
         ASSERT_TRUE(WaitFor(hasComeSoFar));
         process.Signal(SIGSTOP);

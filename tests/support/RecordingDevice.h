@@ -22,6 +22,7 @@ namespace Moka::Testing::detail {
 
 // What every device of the real renderer has at least.
 constexpr int kDefaultMaxTextureSize = 4096;
+constexpr char kDefaultGpuName[] = "recording renderer";
 
 // An image; textures made from a model and targets share one.
 struct Surface {
@@ -102,6 +103,7 @@ struct Device : NonAssignable {
     std::thread::id renderThread;
     int deviceMaxTextureSize = kDefaultMaxTextureSize;
     int limitedTextureSize = 0;
+    std::string gpuName = kDefaultGpuName;
     RendererStatistics counters; // the counters only; objects are counted when asked for
 
     bool keepsRecords = true;

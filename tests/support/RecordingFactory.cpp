@@ -21,7 +21,7 @@ public:
         return device->GetMaxTextureSize();
     }
     char const* GetVendor() const override { return IfAttached("Moka"); }
-    char const* GetRenderer() const override { return IfAttached("recording renderer"); }
+    char const* GetRenderer() const override { return IfAttached(DeviceAccess()->gpuName.c_str()); }
     char const* GetVersion() const override { return IfAttached("OpenGL ES 3.0 in memory"); }
 
 private:

@@ -26,6 +26,7 @@ void RecordingRenderer::Reset() {
     device->attached = false;
     ++device->context; // what is still alive is left behind
     device->deviceMaxTextureSize = kDefaultMaxTextureSize;
+    device->gpuName = kDefaultGpuName;
     device->counters = {};
     device->keepsRecords = true;
     device->calls.clear();
@@ -61,6 +62,11 @@ int RecordingRenderer::CountCalls(std::string const& operation) {
 std::vector<std::string> RecordingRenderer::GetViolations() {
     DeviceAccess const device;
     return device->violations;
+}
+
+void RecordingRenderer::SetGpuName(std::string const& name) {
+    DeviceAccess const device;
+    device->gpuName = name;
 }
 
 void RecordingRenderer::SetMaxTextureSize(int texels) {

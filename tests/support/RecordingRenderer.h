@@ -83,6 +83,9 @@ public:
     // still lowers it.
     static void SetMaxTextureSize(int texels);
 
+    // What the device is called, "recording renderer" unless set.
+    static void SetGpuName(std::string const& name);
+
     // Makes the n-th creation from now fail (1 is the next one), or every one of a kind until
     // StopFailing(). Programs are made in every case and are not counted.
     static void FailCreation(int n);

@@ -1,8 +1,8 @@
 #include "moka/base/BitmapFactory.h"
 
 #include "moka/base/Bitmap.h"
+#include "moka/base/Log.h"
 #include "moka/base/String.h"
-#include "moka/base/System.h"
 #include "moka/base/codec/ImageCodec.h"
 #include "moka/base/log/AndroidLog.h"
 
@@ -31,9 +31,8 @@ constexpr Extension kExtensions[] = {{"png", ImageFormat::Png},
 
 std::string LastComponent(std::string const& path) { return path.substr(path.rfind('/') + 1); }
 
-// A person must see which file it was, but a log may leave the device, and folders tell more than names do.
 std::string Printable(std::string const& path) {
-    std::string name = System::IsBuildTypeEngMode() ? path : LastComponent(path);
+    std::string name = Log::ConvertSecureLog(path);
     for (char& c : name) {
         if (static_cast<unsigned char>(c) < ' ' || c == 0x7F) c = '?';
     }
@@ -45,19 +44,41 @@ void LogFailure(char const* action, std::string const& path, std::string const& 
                         Printable(path).c_str(), reason.c_str());
 }
 
+// The log line, then the reason for the caller.
+void Fail(char const* action, std::string const& path, std::string& reason, std::string* told) {
+    LogFailure(action, path, reason);
+    if (told) told->swap(reason);
+}
+
+void TellNoMemory(std::string* told) noexcept {
+    if (!told) return;
+    try {
+        *told = "not enough memory";
+    } catch (std::bad_alloc const&) {
+        told->clear();
+    }
+}
+
+// What was read all the same.
+void LogIgnoredProfile(std::string const& path, std::string const& reason) {
+    __android_log_print(ANDROID_LOG_WARN, "mok_log", "image '%s': its colour profile is ignored: %s",
+                        Printable(path).c_str(), reason.c_str());
+}
+
 // Strings and codecs throw when memory runs out, which is a failure like any other here.
 template <class Function>
-auto Attempt(char const* action, Function const& function) -> decltype(function()) {
+auto Attempt(char const* action, std::string* told, Function const& function) -> decltype(function()) {
     try {
         return function();
     } catch (std::bad_alloc const&) {
         __android_log_print(ANDROID_LOG_ERROR, "mok_log", "cannot %s image: not enough memory", action);
+        TellNoMemory(told);
         return {};
     }
 }
 
 bool ToPath(String const* text, std::string& path, std::string& reason) {
-    if (text) path = text->ToUtf8();
+    if (text) path = text->ToFileName();
     if (path.empty()) {
         reason = "no path is given";
     } else if (path.find('\0') != std::string::npos) {
@@ -98,13 +119,14 @@ Bitmap* Decode(ImageSource& source, PixelSize target, std::string& reason) {
     return bitmap;
 }
 
-Bitmap* DecodeFile(String const* text, PixelSize target) {
+Bitmap* DecodeFile(String const* text, PixelSize target, std::string* told) {
     std::string path;
     std::string reason;
     ImageSource source;
     bool const isOpen = ToPath(text, path, reason) && source.OpenFile(path.c_str(), reason);
     Bitmap* const bitmap = isOpen ? Decode(source, target, reason) : nullptr;
-    if (!bitmap) LogFailure("read", path, reason);
+    if (!bitmap) Fail("read", path, reason, told);
+    if (bitmap && !reason.empty()) LogIgnoredProfile(path, reason);
     return bitmap;
 }
 
@@ -162,25 +184,35 @@ bool Save(Bitmap const* bitmap, std::string const& path, int quality, std::strin
 } // namespace
 
 Bitmap* BitmapFactory::CreateBitmap(String const* path, int width, int height) {
-    return Attempt("read", [&]() -> Bitmap* {
-        std::string reason;
-        if (detail::CheckSize(width, height, reason)) return DecodeFile(path, {width, height});
-        LogFailure("read", path ? path->ToUtf8() : std::string(), "the size asked for, " + reason);
+    return CreateBitmap(path, width, height, nullptr);
+}
+
+Bitmap* BitmapFactory::CreateBitmap(String const* path, int width, int height, std::string* reason) {
+    return Attempt("read", reason, [&]() -> Bitmap* {
+        std::string wrong;
+        if (detail::CheckSize(width, height, wrong)) return DecodeFile(path, {width, height}, reason);
+        wrong.insert(0, "the size asked for, ");
+        Fail("read", path ? path->ToUtf8() : std::string(), wrong, reason);
         return nullptr;
     });
 }
 
 Bitmap* BitmapFactory::CreateBitmapForGraphics(String const* path) {
-    return Attempt("read", [&] { return DecodeFile(path, {}); });
+    return CreateBitmapForGraphics(path, nullptr);
+}
+
+Bitmap* BitmapFactory::CreateBitmapForGraphics(String const* path, std::string* reason) {
+    return Attempt("read", reason, [&] { return DecodeFile(path, {}, reason); });
 }
 
 Bitmap* BitmapFactory::CreateBitmapFromMemory(void const* data, std::size_t size, char const* name) {
-    return Attempt("read", [&] {
+    return Attempt("read", nullptr, [&] {
         std::string reason;
         ImageSource source;
         source.OpenMemory(data, data ? size : 0);
         Bitmap* const bitmap = Decode(source, {}, reason);
-        if (!bitmap) LogFailure("read", name ? name : "in memory", reason);
+        if (!bitmap) LogFailure("read", name ? name : "", reason);
+        if (bitmap && !reason.empty()) LogIgnoredProfile(name ? name : "", reason);
         return bitmap;
     });
 }
@@ -197,26 +229,34 @@ Bitmap* BitmapFactory::CreateBitmapFromBuffer(unsigned char* buffer, int width, 
 }
 
 bool BitmapFactory::SaveBitmap(Bitmap const* bitmap, String const* path, int quality) {
-    return Attempt("save", [&] {
+    return SaveBitmap(bitmap, path, quality, nullptr);
+}
+
+bool BitmapFactory::SaveBitmap(Bitmap const* bitmap, String const* path, int quality, std::string* reason) {
+    return Attempt("save", reason, [&] {
         std::string text;
-        std::string reason;
+        std::string wrong;
         bool const isSaved =
-            ToPath(path, text, reason) && Save(bitmap, text, std::clamp(quality, 0, 100), reason);
-        if (!isSaved) LogFailure("save", text, reason);
+            ToPath(path, text, wrong) && Save(bitmap, text, std::clamp(quality, 0, 100), wrong);
+        if (!isSaved) Fail("save", text, wrong, reason);
         return isSaved;
     });
 }
 
 bool BitmapFactory::GetImageInfo(String const* path, ImageInfo* info) {
-    return Attempt("read", [&] {
+    return GetImageInfo(path, info, nullptr);
+}
+
+bool BitmapFactory::GetImageInfo(String const* path, ImageInfo* info, std::string* reason) {
+    return Attempt("read", reason, [&] {
         std::string text;
-        std::string reason;
+        std::string wrong;
         ImageSource source;
         ImageInfo found;
-        bool const isOpen = ToPath(path, text, reason) && source.OpenFile(text.c_str(), reason);
-        ImageCodec const* const codec = isOpen ? FindCodec(source, reason) : nullptr;
-        if (!codec || !codec->readInfo(source, found, reason)) {
-            LogFailure("read", text, reason);
+        bool const isOpen = ToPath(path, text, wrong) && source.OpenFile(text.c_str(), wrong);
+        ImageCodec const* const codec = isOpen ? FindCodec(source, wrong) : nullptr;
+        if (!codec || !codec->readInfo(source, found, wrong)) {
+            Fail("read", text, wrong, reason);
             return false;
         }
         found.format = codec->format;
@@ -227,7 +267,7 @@ bool BitmapFactory::GetImageInfo(String const* path, ImageInfo* info) {
 }
 
 ImageFormat BitmapFactory::GetFormatByExtension(String const* path) {
-    return Attempt("name", [&] { return path ? FormatOf(path->ToUtf8()) : ImageFormat::Unknown; });
+    return Attempt("name", nullptr, [&] { return path ? FormatOf(path->ToUtf8()) : ImageFormat::Unknown; });
 }
 
 char const* BitmapFactory::GetFormatName(ImageFormat format) {

@@ -45,10 +45,11 @@ struct ImageCodec {
     // the file has.
     bool (*matches)(ByteSpan head);
 
-    // Fills in width, height and hasAlpha from the header alone.
+    // Fills in all but format and fileBytes, from what stands before the pixels where that is enough.
     bool (*readInfo)(ImageSource& source, ImageInfo& info, std::string& reason);
 
-    // target is the size the image shall have; {0, 0} is its own. target is within the limits.
+    // target is the size the image shall have; {0, 0} is its own. target is within the limits. Where it
+    // succeeds, a reason is why the file's colour profile was ignored.
     bool (*decode)(ImageSource& source, PixelSize target, PixelBuffer& image, std::string& reason);
 
     // view is within the limits; quality is 0 ... 100.

@@ -1,14 +1,18 @@
-// JpegCodec.cpp: JPEG through TurboJPEG. Grey, RGB, YCbCr, CMYK and YCCK files become RGB, opaque; an EXIF
-// orientation is not applied, the rows come as the file has them. Saving flattens on white.
+// JpegCodec.cpp: JPEG through TurboJPEG. Grey, RGB, YCbCr, CMYK and YCCK files become sRGB, opaque, by their
+// ICC profile where they have one; an EXIF orientation is not applied, the rows come as the file has them.
+// Saving flattens on white.
 // Damage: a warning of the library means that it guessed pixels, and is a failure, but for the few that real
 //         cameras cause and that leave the pixels right (kHarmless). The library keeps the first warning of
 //         an image only, so the commonest damage, a missing end, is looked for here.
+#include "moka/base/codec/ColorTransform.h"
+#include "moka/base/codec/Exif.h"
 #include "moka/base/codec/ImageCodec.h"
 #include "moka/base/codec/Premultiply.h"
 
 #include <algorithm>
 #include <cstring>
 #include <turbojpeg.h>
+#include <vector>
 
 namespace Moka::detail {
 namespace {
@@ -58,7 +62,38 @@ bool Matches(ByteSpan head) {
 struct Markers {
     bool hasEnd = false;
     bool hasAdobe = false;
+    ByteSpan exif;
+    // An ICC profile is cut into up to 255 parts, which may come in any order; each says its number, from 1,
+    // and how many there are.
+    std::vector<ByteSpan> profileParts;
+    bool isProfileWhole = true;
 };
+
+template <std::size_t size>
+bool BeginsWith(ByteSpan bytes, char const (&text)[size]) {
+    return bytes.size >= size && std::memcmp(bytes.data, text, size) == 0; // with its zero byte
+}
+
+void AddProfilePart(ByteSpan part, Markers& markers) {
+    unsigned const number = part.size >= 2 ? part.data[0] : 0;
+    unsigned const count = part.size >= 2 ? part.data[1] : 0;
+    markers.profileParts.resize(std::max<std::size_t>(markers.profileParts.size(), count));
+    bool const isNew = number >= 1 && number <= count && markers.profileParts.size() == count &&
+                       markers.profileParts[number - 1].data == nullptr;
+    if (isNew)
+        markers.profileParts[number - 1] = {part.data + 2, part.size - 2};
+    else
+        markers.isProfileWhole = false;
+}
+
+void ReadSegment(unsigned code, ByteSpan content, Markers& markers) {
+    constexpr char kProfile[] = "ICC_PROFILE";
+    if (code == 0xEE && content.size >= 12 && std::memcmp(content.data, "Adobe", 5) == 0)
+        markers.hasAdobe = true;
+    if (code == 0xE1 && BeginsWith(content, "Exif\0") && !markers.exif.data) markers.exif = content;
+    if (code == 0xE2 && BeginsWith(content, kProfile))
+        AddProfilePart({content.data + sizeof(kProfile), content.size - sizeof(kProfile)}, markers);
+}
 
 // Segments are skipped by their length, so an end marker in an embedded preview is not taken for the image's.
 // In between, and in coded data, a marker is FF and neither stuffing (00, FF) nor a restart (D0 ... D7).
@@ -77,10 +112,10 @@ Markers FindMarkers(ByteSpan file) {
         markers.hasEnd = code == 0xD9;
         if (markers.hasEnd || i + 4 > file.size) break;
         unsigned char const* const segment = file.data + i + 2;
-        std::size_t const length = segment[0] * 256u + segment[1];
-        bool const holdsName = length >= 14 && i + 9 <= file.size;
-        if (code == 0xEE && holdsName && std::memcmp(segment + 2, "Adobe", 5) == 0) markers.hasAdobe = true;
-        i += 2 + std::max<std::size_t>(length, 2);
+        std::size_t const length = std::max<std::size_t>(segment[0] * 256u + segment[1], 2);
+        std::size_t const left = file.size - i - 4;
+        ReadSegment(code, {segment + 2, std::min(length - 2, left)}, markers);
+        i += 2 + length;
     }
     return markers;
 }
@@ -90,6 +125,8 @@ struct Header {
     int height = -1;
     int subsampling = -1;
     int colourSpace = -1;
+
+    bool IsCmyk() const { return colourSpace == TJCS_CMYK || colourSpace == TJCS_YCCK; }
 };
 
 // An odd subsampling makes the library call the header bad, but it decodes it; so what counts is whether the
@@ -102,13 +139,36 @@ bool ReadHeader(Handle const& handle, ByteSpan file, Header& header, std::string
     return Refuse(reason, result == 0 ? "it holds tables but no image" : handle.GetText());
 }
 
+// The parts in a row; empty where there are none, or where some are missing.
+std::vector<unsigned char> JoinProfile(Markers const& markers) {
+    std::vector<unsigned char> profile;
+    bool const isWhole =
+        markers.isProfileWhole && std::all_of(markers.profileParts.begin(), markers.profileParts.end(),
+                                              [](ByteSpan part) { return part.data != nullptr; });
+    if (!isWhole) return profile;
+    for (ByteSpan const& part : markers.profileParts)
+        profile.insert(profile.end(), part.data, part.data + part.size);
+    return profile;
+}
+
+void DescribeMarkers(ByteSpan file, ImageInfo& info) {
+    Markers const markers = FindMarkers(file);
+    std::vector<unsigned char> const profile = JoinProfile(markers);
+    info.orientation = ReadOrientation(markers.exif);
+    if (!markers.profileParts.empty()) info.profile = GetProfileName({profile.data(), profile.size()});
+}
+
 bool ReadInfo(ImageSource& source, ImageInfo& info, std::string& reason) {
     Handle const handle(tjInitDecompress());
     Header header;
     for (std::uint64_t count = kFirstPrefix;; count *= 8) {
         ByteSpan head;
         if (!source.Prefix(count, head, reason)) return false;
-        if (ReadHeader(handle, head, header, reason)) break;
+        // The library has then seen all markers before the pixels.
+        if (ReadHeader(handle, head, header, reason)) {
+            DescribeMarkers(head, info);
+            break;
+        }
         if (count >= source.GetSize()) return false;
     }
     info.width = header.width;
@@ -144,6 +204,23 @@ void ConvertCmyk(PixelBuffer const& image, bool isInverted) {
     }
 }
 
+// Leaves a reason where the file's profile is ignored.
+void ConvertColors(Header const& header, Markers const& markers, PixelBuffer const& image,
+                   std::string& reason) {
+    bool const isCmyk = header.IsCmyk();
+    PixelKind const inks = markers.hasAdobe ? PixelKind::CmykLight : PixelKind::CmykInk;
+    PixelKind const light = header.colourSpace == TJCS_GRAY ? PixelKind::Grey : PixelKind::Rgb;
+    ColorTransform colors;
+    if (!markers.profileParts.empty()) {
+        std::vector<unsigned char> const profile = JoinProfile(markers);
+        colors.Open({profile.data(), profile.size()}, isCmyk ? inks : light, reason);
+    }
+    if (colors)
+        colors.Apply(image.pixels.get(), image.GetCount());
+    else if (isCmyk)
+        ConvertCmyk(image, markers.hasAdobe);
+}
+
 bool Decode(ImageSource& source, PixelSize target, PixelBuffer& image, std::string& reason) {
     ByteSpan file;
     if (!source.Prefix(source.GetSize(), file, reason)) return false;
@@ -157,12 +234,12 @@ bool Decode(ImageSource& source, PixelSize target, PixelBuffer& image, std::stri
 
     PixelSize const wanted = ChooseSize(target, own);
     if (!image.Allocate(ChooseDecodedSize(own, wanted), reason)) return false;
-    bool const isCmyk = header.colourSpace == TJCS_CMYK || header.colourSpace == TJCS_YCCK;
-    int const result = tjDecompress2(handle.Get(), file.data, file.size, image.pixels.get(), image.size.width,
-                                     static_cast<int>(image.GetStride()), image.size.height,
-                                     isCmyk ? TJPF_CMYK : TJPF_RGBA, TJFLAG_ACCURATEDCT | TJFLAG_LIMITSCANS);
+    int const result =
+        tjDecompress2(handle.Get(), file.data, file.size, image.pixels.get(), image.size.width,
+                      static_cast<int>(image.GetStride()), image.size.height,
+                      header.IsCmyk() ? TJPF_CMYK : TJPF_RGBA, TJFLAG_ACCURATEDCT | TJFLAG_LIMITSCANS);
     if (!handle.IsHarmless(result)) return Refuse(reason, handle.GetText());
-    if (isCmyk) ConvertCmyk(image, markers.hasAdobe);
+    ConvertColors(header, markers, image, reason);
     return ScaleImage(image, wanted, reason);
 }
 

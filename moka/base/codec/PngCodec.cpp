@@ -1,9 +1,13 @@
 // PngCodec.cpp: PNG through libpng, row by row. Every colour type, depth and interlacing becomes RGBA8;
-// 16-bit channels are rounded. Gamma, colour profiles and text are not looked at: the file's numbers are the
-// pixels.
+// 16-bit channels are rounded.
+// Colours: an ICC profile counts first, then the mark "sRGB", then primaries with gamma, then gamma alone, which
+//          libpng itself corrects. Gamma 0.45455 is sRGB's, near enough to change nothing.
+#include "moka/base/codec/ColorTransform.h"
+#include "moka/base/codec/Exif.h"
 #include "moka/base/codec/ImageCodec.h"
 #include "moka/base/codec/Premultiply.h"
 
+#include <cmath>
 #include <csetjmp>
 #include <cstdio>
 #include <cstring>
@@ -18,6 +22,12 @@ namespace {
 // this level choosing filters costs more time than it saves bytes, for either.
 constexpr int kCompressionLevel = 3;
 constexpr int kFilter = PNG_FILTER_SUB;
+// What decides colours, and only that, is read besides pixels.
+constexpr png_byte kColorChunks[] = "gAMA\0cHRM\0sRGB\0iCCP";
+constexpr int kColorChunkCount = 4;
+// For what a person asks of a file.
+constexpr png_byte kExifChunk[] = "eXIf";
+constexpr png_byte kAnimationChunk[] = "acTL";
 // One IDAT chunk, and one write, per this many bytes.
 constexpr std::size_t kChunkBytes = 65536;
 
@@ -25,6 +35,7 @@ constexpr std::size_t kChunkBytes = 65536;
 // callers of the functions that call setjmp, and those have only plain locals.
 struct ErrorText {
     char text[160] = "";
+    char profile[160] = ""; // why libpng refuses the colour profile
 };
 
 void OnError(png_structp png, png_const_charp message) {
@@ -33,8 +44,14 @@ void OnError(png_structp png, png_const_charp message) {
     png_longjmp(png, 1);
 }
 
-// What libpng can go on from is no news to a caller who gets the pixels.
-void OnWarning(png_structp, png_const_charp) {}
+// What libpng can go on from is no news to a caller who gets the pixels, but for a profile that it refuses.
+void OnWarning(png_structp png, png_const_charp message) {
+    constexpr char kProfile[] = "iCCP: ";
+    constexpr std::size_t kLength = sizeof(kProfile) - 1;
+    auto* const error = static_cast<ErrorText*>(png_get_error_ptr(png));
+    if (std::strncmp(message, kProfile, kLength) == 0)
+        std::snprintf(error->profile, sizeof(error->profile), "%s", message + kLength);
+}
 
 // --- reading
 
@@ -50,6 +67,8 @@ struct Reader {
     ImageSource* source = nullptr;
     bool isAtEnd = false;
     int passes = 1;
+    ColorTransform colors;
+    png_fixed_point gamma = 0; // that libpng shall correct, times 100,000; 0 is none
 
     PixelSize GetSize() const {
         return {static_cast<int>(png_get_image_width(png, info)),
@@ -69,7 +88,9 @@ void OnRead(png_structp png, png_bytep to, std::size_t count) {
     png_error(png, "");
 }
 
-bool OpenReader(Reader& reader, ImageSource& source) {
+enum class Purpose { Pixels, Info };
+
+bool OpenReader(Reader& reader, ImageSource& source, Purpose purpose) {
     reader.source = &source;
     std::strcpy(reader.error.text, "not enough memory to decode it");
     reader.png = png_create_read_struct(PNG_LIBPNG_VER_STRING, &reader.error, OnError, OnWarning);
@@ -81,6 +102,11 @@ bool OpenReader(Reader& reader, ImageSource& source) {
     // A negative count skips, unread and not inflated, every chunk that changes no pixel. So none of them
     // costs memory, and the limit on their length only has to let through what real files carry.
     png_set_keep_unknown_chunks(reader.png, PNG_HANDLE_CHUNK_NEVER, nullptr, -1);
+    png_set_keep_unknown_chunks(reader.png, PNG_HANDLE_CHUNK_AS_DEFAULT, kColorChunks, kColorChunkCount);
+    if (purpose == Purpose::Info) {
+        png_set_keep_unknown_chunks(reader.png, PNG_HANDLE_CHUNK_AS_DEFAULT, kExifChunk, 1);
+        png_set_keep_unknown_chunks(reader.png, PNG_HANDLE_CHUNK_ALWAYS, kAnimationChunk, 1);
+    }
     png_set_chunk_malloc_max(reader.png, 64 << 20);
     // The sides are checked right after this, where the message can name them; nothing is allocated by them
     // before.
@@ -89,10 +115,75 @@ bool OpenReader(Reader& reader, ImageSource& source) {
     return true;
 }
 
-bool ReadHeader(Reader& reader, ImageSource& source, std::string& reason) {
-    if (!OpenReader(reader, source)) return reader.Explain(reason);
+bool ReadHeader(Reader& reader, ImageSource& source, Purpose purpose, std::string& reason) {
+    if (!OpenReader(reader, source, purpose)) return reader.Explain(reason);
     return CheckSize(png_get_image_width(reader.png, reader.info),
                      png_get_image_height(reader.png, reader.info), reason);
+}
+
+// Those that say what the numbers of a file look like.
+bool UseProfile(Reader& reader, std::string& reason) {
+    png_charp name = nullptr;
+    int compression = 0;
+    png_bytep data = nullptr;
+    png_uint_32 size = 0;
+    if (png_get_iCCP(reader.png, reader.info, &name, &compression, &data, &size) != PNG_INFO_iCCP) {
+        reason = reader.error.profile;
+        return false;
+    }
+    bool const isGrey = (png_get_color_type(reader.png, reader.info) & PNG_COLOR_MASK_COLOR) == 0;
+    return reader.colors.Open({data, size}, isGrey ? PixelKind::Grey : PixelKind::Rgb, reason);
+}
+
+bool IsMarkedSrgb(Reader const& reader) {
+    int intent = 0;
+    return png_get_sRGB(reader.png, reader.info, &intent) == PNG_INFO_sRGB;
+}
+
+bool GetPrimaries(Reader const& reader, Chromaticities& p) {
+    return png_get_cHRM(reader.png, reader.info, &p.white[0], &p.white[1], &p.red[0], &p.red[1], &p.green[0],
+                        &p.green[1], &p.blue[0], &p.blue[1]) == PNG_INFO_cHRM;
+}
+
+bool AreOfSrgb(Chromaticities const& p) {
+    constexpr Chromaticities kSrgb = {{0.3127, 0.329}, {0.64, 0.33}, {0.3, 0.6}, {0.15, 0.06}};
+    constexpr double kNear = 0.002;
+    auto const isNear = [](double const(&a)[2], double const(&b)[2]) {
+        return std::abs(a[0] - b[0]) < kNear && std::abs(a[1] - b[1]) < kNear;
+    };
+    return isNear(p.white, kSrgb.white) && isNear(p.red, kSrgb.red) && isNear(p.green, kSrgb.green) &&
+           isNear(p.blue, kSrgb.blue);
+}
+
+// Leaves a reason where a profile is ignored.
+void ChooseColors(Reader& reader, std::string& reason) {
+    if (UseProfile(reader, reason) || IsMarkedSrgb(reader)) return;
+    png_fixed_point gamma = 0;
+    bool const hasGamma = png_get_gAMA_fixed(reader.png, reader.info, &gamma) == PNG_INFO_gAMA;
+    Chromaticities primaries;
+    if (GetPrimaries(reader, primaries) && !AreOfSrgb(primaries)) {
+        if (reader.colors.Open(primaries, hasGamma ? gamma / 100000.0 : 0, reason)) return;
+    }
+    if (hasGamma) reader.gamma = gamma;
+}
+
+std::string DescribeColors(Reader const& reader) {
+    png_charp name = nullptr;
+    int compression = 0;
+    png_bytep data = nullptr;
+    png_uint_32 size = 0;
+    if (png_get_iCCP(reader.png, reader.info, &name, &compression, &data, &size) == PNG_INFO_iCCP)
+        return GetProfileName({data, size});
+    if (reader.error.profile[0] != '\0') return "damaged";
+    if (IsMarkedSrgb(reader)) return "sRGB";
+    double gamma = 0;
+    Chromaticities primaries;
+    bool const hasPrimaries = GetPrimaries(reader, primaries) && !AreOfSrgb(primaries);
+    if (png_get_gAMA(reader.png, reader.info, &gamma) != PNG_INFO_gAMA)
+        return hasPrimaries ? "own primaries" : "";
+    char text[40];
+    std::snprintf(text, sizeof(text), "gamma %.5g%s", gamma, hasPrimaries ? ", own primaries" : "");
+    return text;
 }
 
 bool HasAlpha(Reader const& reader) {
@@ -106,9 +197,15 @@ bool StartPixels(Reader& reader) {
     png_set_scale_16(reader.png);
     png_set_gray_to_rgb(reader.png);
     png_set_add_alpha(reader.png, 255, PNG_FILLER_AFTER);
+    if (reader.gamma > 0) png_set_gamma_fixed(reader.png, PNG_DEFAULT_sRGB, reader.gamma);
     reader.passes = png_set_interlace_handling(reader.png);
     png_read_update_info(reader.png, reader.info);
     return true;
+}
+
+void FinishRow(Reader const& reader, unsigned char* row, std::size_t count) {
+    if (reader.colors) reader.colors.Apply(row, count);
+    PremultiplyPixels(row, count);
 }
 
 // An interlaced image comes in passes over the same rows; the last one completes each.
@@ -118,7 +215,7 @@ bool ReadRows(Reader& reader, PixelBuffer const& image) {
         for (int y = 0; y < image.size.height; ++y) {
             png_read_row(reader.png, image.Row(y), nullptr);
             if (pass == reader.passes)
-                PremultiplyPixels(image.Row(y), static_cast<std::size_t>(image.size.width));
+                FinishRow(reader, image.Row(y), static_cast<std::size_t>(image.size.width));
         }
     }
     png_read_end(reader.png, nullptr);
@@ -129,7 +226,7 @@ bool ReadRowsInto(Reader& reader, RowScaler& scaler, PixelBuffer const& row, int
     if (setjmp(png_jmpbuf(reader.png))) return false;
     for (int y = 0; y < height; ++y) {
         png_read_row(reader.png, row.Row(0), nullptr);
-        PremultiplyPixels(row.Row(0), row.GetCount());
+        FinishRow(reader, row.Row(0), row.GetCount());
         scaler.Push(row.Row(0));
     }
     png_read_end(reader.png, nullptr);
@@ -149,7 +246,8 @@ bool DecodeScaled(Reader& reader, PixelSize own, PixelBuffer& image, std::string
 
 bool Decode(ImageSource& source, PixelSize target, PixelBuffer& image, std::string& reason) {
     Reader reader;
-    if (!ReadHeader(reader, source, reason)) return false;
+    if (!ReadHeader(reader, source, Purpose::Pixels, reason)) return false;
+    ChooseColors(reader, reason);
     if (!StartPixels(reader)) return reader.Explain(reason);
     PixelSize const own = reader.GetSize();
     PixelSize const wanted = ChooseSize(target, own);
@@ -161,12 +259,34 @@ bool Decode(ImageSource& source, PixelSize target, PixelBuffer& image, std::stri
     return ScaleImage(image, wanted, reason);
 }
 
+int GetOrientation(Reader const& reader) {
+    png_uint_32 size = 0;
+    png_bytep data = nullptr;
+    bool const hasExif = png_get_eXIf_1(reader.png, reader.info, &size, &data) == PNG_INFO_eXIf;
+    return hasExif ? ReadOrientation({data, size}) : 1;
+}
+
+// By the chunk of an animation's control, whose first number counts them.
+int CountFrames(Reader const& reader) {
+    png_unknown_chunkp chunks = nullptr;
+    int const count = png_get_unknown_chunks(reader.png, reader.info, &chunks);
+    for (png_unknown_chunkp chunk = chunks; chunk != chunks + count; ++chunk) {
+        if (chunk->size < 4) continue;
+        png_uint_32 const frames = png_get_uint_32(chunk->data);
+        if (frames >= 1 && frames <= PNG_UINT_31_MAX) return static_cast<int>(frames);
+    }
+    return 1;
+}
+
 bool ReadInfo(ImageSource& source, ImageInfo& info, std::string& reason) {
     Reader reader;
-    if (!ReadHeader(reader, source, reason)) return false;
+    if (!ReadHeader(reader, source, Purpose::Info, reason)) return false;
     info.width = reader.GetSize().width;
     info.height = reader.GetSize().height;
     info.hasAlpha = HasAlpha(reader);
+    info.profile = DescribeColors(reader);
+    info.orientation = GetOrientation(reader);
+    info.frames = CountFrames(reader);
     return true;
 }
 
@@ -214,6 +334,7 @@ bool WriteRows(Writer& writer, PixelView const& view, bool isOpaque, unsigned ch
                  static_cast<png_uint_32>(view.size.height), 8,
                  isOpaque ? PNG_COLOR_TYPE_RGB : PNG_COLOR_TYPE_RGBA, PNG_INTERLACE_NONE,
                  PNG_COMPRESSION_TYPE_DEFAULT, PNG_FILTER_TYPE_DEFAULT);
+    png_set_sRGB(writer.png, writer.info, PNG_sRGB_INTENT_PERCEPTUAL);
     png_write_info(writer.png, writer.info);
     if (isOpaque) png_set_filler(writer.png, 0, PNG_FILLER_AFTER);
     for (int y = 0; y < view.size.height; ++y) {

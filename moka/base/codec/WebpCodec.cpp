@@ -1,10 +1,15 @@
-// WebpCodec.cpp: WebP through libwebp, still images only. Quality 100 is lossless, below it lossy with
-// lossless alpha. The library holds a decoded lossless image once more inside while it decodes.
+// WebpCodec.cpp: WebP through libwebp; of an animation the first frame, on a transparent canvas. Quality 100
+// is lossless, below it lossy with lossless alpha. The library holds a decoded lossless image once more inside
+// while it decodes.
+#include "moka/base/codec/ColorTransform.h"
+#include "moka/base/codec/Exif.h"
 #include "moka/base/codec/ImageCodec.h"
 #include "moka/base/codec/Premultiply.h"
 
+#include <algorithm>
 #include <cstring>
 #include <webp/decode.h>
+#include <webp/demux.h>
 #include <webp/encode.h>
 
 namespace Moka::detail {
@@ -54,36 +59,110 @@ bool ReadFeatures(ImageSource& source, WebPBitstreamFeatures& features, std::str
         if (count >= source.GetSize()) break;
     }
     if (status != VP8_STATUS_OK) return Refuse(reason, Describe(status));
-    if (features.has_animation) return Refuse(reason, "it is animated, and only still images can be read");
     return CheckSize(features.width, features.height, reason);
+}
+
+struct DemuxDeleter {
+    void operator()(WebPDemuxer* demuxer) const { WebPDemuxDelete(demuxer); }
+};
+using Demuxer = std::unique_ptr<WebPDemuxer, DemuxDeleter>;
+
+// The chunks of a file that has more of them than pixels; null without those, and when the file is damaged.
+Demuxer OpenChunks(ByteSpan file, WebPDemuxState& state) {
+    constexpr std::uint32_t kKnown = ICCP_FLAG | EXIF_FLAG | ANIMATION_FLAG;
+    constexpr std::size_t kFlags = 20;
+    bool const isExtended = file.size > kFlags && std::memcmp(file.data + 12, "VP8X", 4) == 0;
+    if (!isExtended || (file.data[kFlags] & kKnown) == 0) return nullptr;
+    WebPData const data{file.data, file.size};
+    return Demuxer(WebPDemuxPartial(&data, &state));
+}
+
+// Of the file's own bytes; empty when there is none.
+ByteSpan FindChunk(Demuxer const& chunks, char const* name) {
+    WebPChunkIterator found = {};
+    if (!chunks || !WebPDemuxGetChunk(chunks.get(), name, 1, &found)) return {};
+    ByteSpan const content{found.chunk.bytes, found.chunk.size};
+    WebPDemuxReleaseChunkIterator(&found);
+    return content;
+}
+
+// What is said behind the pixels makes it read the whole file.
+bool ReadChunks(ImageSource& source, ImageInfo& info, std::string& reason) {
+    ByteSpan file;
+    if (!source.Prefix(kFirstPrefix, file, reason)) return false;
+    WebPDemuxState state{};
+    if (!OpenChunks(file, state)) return true;
+    if (!source.Prefix(source.GetSize(), file, reason)) return false;
+    Demuxer const chunks = OpenChunks(file, state);
+    if (!chunks) return true;
+    ByteSpan const profile = FindChunk(chunks, "ICCP");
+    if (profile.data) info.profile = GetProfileName(profile);
+    info.orientation = ReadOrientation(FindChunk(chunks, "EXIF"));
+    info.frames = std::max(1, static_cast<int>(WebPDemuxGetI(chunks.get(), WEBP_FF_FRAME_COUNT)));
+    return true;
 }
 
 bool ReadInfo(ImageSource& source, ImageInfo& info, std::string& reason) {
     WebPBitstreamFeatures features;
-    if (!ReadFeatures(source, features, reason)) return false;
+    if (!ReadFeatures(source, features, reason) || !ReadChunks(source, info, reason)) return false;
     info.width = features.width;
     info.height = features.height;
     info.hasAlpha = features.has_alpha != 0;
     return true;
 }
 
+// Where pixels go: a part of an image, whose rows are a stride apart.
+struct Target {
+    unsigned char* pixels;
+    PixelSize size;
+    std::size_t stride;
+};
+
 // Straight alpha, because the library's own premultiplying does not round to nearest.
-bool DecodePixels(ByteSpan file, bool isScaled, PixelBuffer const& image, std::string& reason) {
+bool DecodePixels(ByteSpan file, bool isScaled, Target const& target, std::string& reason) {
     WebPDecoderConfig config;
     if (!WebPInitDecoderConfig(&config)) return Refuse(reason, "libwebp does not fit the one built against");
     config.options.use_scaling = isScaled;
-    config.options.scaled_width = image.size.width;
-    config.options.scaled_height = image.size.height;
+    config.options.scaled_width = target.size.width;
+    config.options.scaled_height = target.size.height;
     config.output.colorspace = MODE_RGBA;
     config.output.is_external_memory = 1;
-    config.output.u.RGBA.rgba = image.pixels.get();
-    config.output.u.RGBA.stride = static_cast<int>(image.GetStride());
-    config.output.u.RGBA.size = image.GetCount() * 4;
+    config.output.u.RGBA.rgba = target.pixels;
+    config.output.u.RGBA.stride = static_cast<int>(target.stride);
+    config.output.u.RGBA.size = target.stride * static_cast<std::size_t>(target.size.height - 1) +
+                                static_cast<std::size_t>(target.size.width) * 4;
     VP8StatusCode const status = WebPDecode(file.data, file.size, &config);
     WebPFreeDecBuffer(&config.output);
-    if (status != VP8_STATUS_OK) return Refuse(reason, Describe(status));
+    return status == VP8_STATUS_OK || Refuse(reason, Describe(status));
+}
+
+// Leaves a reason where the file's profile is ignored.
+void FinishPixels(Demuxer const& chunks, PixelBuffer const& image, std::string& reason) {
+    ColorTransform colors;
+    ByteSpan const profile = FindChunk(chunks, "ICCP");
+    if (profile.data) colors.Open(profile, PixelKind::Rgb, reason);
+    if (colors) colors.Apply(image.pixels.get(), image.GetCount());
     PremultiplyPixels(image.pixels.get(), image.GetCount());
-    return true;
+}
+
+struct Frame : NonAssignable {
+    ~Frame() { WebPDemuxReleaseIterator(&frame); }
+    WebPIterator frame = {};
+};
+
+bool DecodeFirstFrame(Demuxer const& chunks, PixelBuffer const& image, std::string& reason) {
+    Frame owner;
+    WebPIterator& frame = owner.frame;
+    if (!chunks || !WebPDemuxGetFrame(chunks.get(), 1, &frame) || !frame.complete)
+        return Refuse(reason, "it has no first frame");
+    bool const isInside = frame.x_offset >= 0 && frame.y_offset >= 0 &&
+                          frame.width <= image.size.width - frame.x_offset &&
+                          frame.height <= image.size.height - frame.y_offset;
+    if (!isInside) return Refuse(reason, "its first frame lies outside the image");
+    std::memset(image.pixels.get(), 0, image.GetCount() * 4);
+    unsigned char* const corner = image.Row(frame.y_offset) + 4 * static_cast<std::size_t>(frame.x_offset);
+    return DecodePixels({frame.fragment.bytes, frame.fragment.size}, false,
+                        {corner, {frame.width, frame.height}, image.GetStride()}, reason);
 }
 
 bool Decode(ImageSource& source, PixelSize target, PixelBuffer& image, std::string& reason) {
@@ -94,9 +173,19 @@ bool Decode(ImageSource& source, PixelSize target, PixelBuffer& image, std::stri
     PixelSize const own{features.width, features.height};
     PixelSize const wanted = ChooseSize(target, own);
     // The library's scaler is an area filter too, but only where both axes shrink.
-    bool const isScaledByLibrary = wanted != own && wanted.width <= own.width && wanted.height <= own.height;
-    return image.Allocate(isScaledByLibrary ? wanted : own, reason) &&
-           DecodePixels(file, isScaledByLibrary, image, reason) && ScaleImage(image, wanted, reason);
+    bool const isScaledByLibrary =
+        !features.has_animation && wanted != own && wanted.width <= own.width && wanted.height <= own.height;
+    if (!image.Allocate(isScaledByLibrary ? wanted : own, reason)) return false;
+    WebPDemuxState state{};
+    Demuxer const chunks = OpenChunks(file, state);
+    if (features.has_animation && state != WEBP_DEMUX_DONE) return Refuse(reason, "the file is truncated");
+    bool const isDecoded = features.has_animation
+                               ? DecodeFirstFrame(chunks, image, reason)
+                               : DecodePixels(file, isScaledByLibrary,
+                                              {image.pixels.get(), image.size, image.GetStride()}, reason);
+    if (!isDecoded) return false;
+    FinishPixels(chunks, image, reason);
+    return ScaleImage(image, wanted, reason);
 }
 
 struct Picture : NonAssignable {

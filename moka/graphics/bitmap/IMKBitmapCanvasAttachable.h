@@ -14,6 +14,11 @@ public:
     virtual void DetachFromCanvas() = 0;
     virtual void AttachToCanvasRT(bool release) = 0;
     virtual void DetachFromCanvasRT(bool release) = 0;
+
+    // Whether drawing into a strip, or with -1 into the bitmap as one frame buffer, reaches the bitmap. It does
+    // not where the frame buffer could not be created, or not yet; whoever draws regardless draws into
+    // whatever the host has bound.
+    virtual bool HasFrameBufferRT(int /*strip*/) { return true; }
 };
 
 } // namespace Moka

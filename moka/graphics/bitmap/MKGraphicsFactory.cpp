@@ -27,6 +27,8 @@ bool IsValid(IGLMsgQueue* queue, int width, int height) {
     return false;
 }
 
+bool CanPost(IGLMsgQueue* queue, int useQueue) { return queue || useQueue == 0; }
+
 void LogInvalidParent(IMKBitmap* parent, char const* tag) {
     __android_log_print(ANDROID_LOG_ERROR, "mok_log", "%s, invalid parent bitmap (%p:\"%s\")", "CreateBitmap",
                         static_cast<void*>(parent), tag);
@@ -59,6 +61,7 @@ IMKBitmap* MKGraphicsFactory::CreateBitmap(IGLMsgQueue* queue, IMKBitmap* parent
         LogInvalidParent(parent, parent->GetTag());
         return nullptr;
     }
+    if (!CanPost(queue, useQueue)) return nullptr;
     return new (std::nothrow) MKSharedTextureBitmap(queue, parent, useQueue == 0);
 }
 
@@ -107,8 +110,8 @@ IMKBitmap* MKGraphicsFactory::CreateScreenBitmap(IGLMsgQueue* queue, int x, int 
                                                  int useDefaultFramebuffer, int useQueue) {
     auto const type =
         useDefaultFramebuffer != 0 ? MKBitmap::DefaultFramebuffer : MKBitmap::CurrentFramebuffer;
+    if (!CanPost(queue, useQueue)) return nullptr;
     if (useQueue == 0) return new (std::nothrow) MKScreenBitmapRT(queue, x, y, width, height, type);
-    if (!queue) return nullptr;
     return new (std::nothrow) MKScreenBitmap(queue, x, y, width, height, type);
 }
 
@@ -121,13 +124,13 @@ void MKGraphicsFactory::ReleaseBitmap(IMKBitmap* bitmap) {
 }
 
 IMKCanvas* MKGraphicsFactory::CreateCanvas(IGLMsgQueue* queue, IMKBitmap* target, int useQueue) {
-    if (!queue || !target) return nullptr;
+    if (!target || !CanPost(queue, useQueue)) return nullptr;
     if (useQueue == 0) return new (std::nothrow) MKCanvasRT(queue, target);
     return new (std::nothrow) MKCanvas(queue, target);
 }
 
 IMKPenCanvas* MKGraphicsFactory::CreatePenCanvas(IGLMsgQueue* queue, IMKBitmap* target, int useQueue) {
-    if (!queue || !target) return nullptr;
+    if (!target || !CanPost(queue, useQueue)) return nullptr;
     if (useQueue == 0) return new (std::nothrow) MKPenCanvasRT(queue, target);
     return new (std::nothrow) MKPenCanvas(queue, target);
 }

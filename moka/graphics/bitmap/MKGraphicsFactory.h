@@ -6,6 +6,15 @@
 //         only.
 // Units:  pixels; RGBA8, premultiplied.
 // Fails:  null; an invalid request, and a file that cannot be decoded, log one error line.
+//
+// Without a queue:
+//     from pixels or a file, whole or a region   null, and the error line of an invalid size
+//     over a parent                              a bad parent is null with its error line; else caller-side
+//                                                null without a line, render-thread made
+//     over a screen; canvas, pen canvas          caller-side null without a line, render-thread made
+//     from a texture                             made: without strips it never posts
+// What is made without a queue has no clone, since clones are caller-side; and a canvas without one cannot
+// darken or lighten bitmaps.
 #pragma once
 
 #include "moka/base/Export.h"
@@ -53,8 +62,7 @@ public:
     static Bitmap* CreateScaledCPUBitmap(String const* path, int width, int height);
 
     // Over the host's default frame buffer, or with useDefaultFramebuffer 0 over the one bound when it is
-    // made. Nothing is validated, but a caller-side one needs a queue: null without. Clips that need the
-    // stencil do not work on it.
+    // made. Nothing is validated. Clips that need the stencil do not work on it.
     static IMKBitmap* CreateScreenBitmap(IGLMsgQueue* queue, int x, int y, int width, int height,
                                          int useDefaultFramebuffer, int useQueue);
 
@@ -62,8 +70,8 @@ public:
     static void RefBitmap(IMKBitmap* bitmap);
     static void ReleaseBitmap(IMKBitmap* bitmap);
 
-    // Null, without a message, when queue or target is null. A pen canvas needs a texture bitmap; on another
-    // one it is made, with one error line, and draws nothing.
+    // Null, without a message, when target is null. A pen canvas needs a texture bitmap; on another one it is
+    // made, with one error line, and draws nothing.
     static IMKCanvas* CreateCanvas(IGLMsgQueue* queue, IMKBitmap* target, int useQueue);
     static IMKPenCanvas* CreatePenCanvas(IGLMsgQueue* queue, IMKBitmap* target, int useQueue);
 

@@ -6,9 +6,9 @@
 namespace Moka {
 
 template <class F, class... Values>
-void MKScreenBitmap::PostSelf(F function, Values&&... values) {
+bool MKScreenBitmap::PostSelf(F function, Values&&... values) {
     Ref();
-    WorkerTask::PostMember(mMsgQueue, this, function, std::forward<Values>(values)...);
+    return WorkerTask::PostMember(mMsgQueue, this, function, std::forward<Values>(values)...);
 }
 
 MKScreenBitmap::MKScreenBitmap(IGLMsgQueue* queue, int x, int y, int width, int height, FramebufferType type)
@@ -45,18 +45,22 @@ void MKScreenBitmap::GetPixelAsync(Point const& p, void* userData, PixelCallback
 }
 
 void MKScreenBitmap::getPixelAsyncRT(Point const& p, void* userData, PixelCallback callback) {
+    auto const self = RefPtr<MKScreenBitmap>::Adopt(this);
     unsigned int const pixel = ReadPixel(p);
     if (callback) callback(pixel, userData);
-    Unref();
 }
 
 void MKScreenBitmap::GetBitmapData(Rect const& r, void* destination) {
-    PostSelf(&MKScreenBitmap::getBitmapDataRT, r, destination);
+    auto const read = detail::BlockingRead::Make();
+    bool const accepted = PostSelf(&MKScreenBitmap::getBitmapDataRT, r, destination, read);
     mMsgQueue->WaitForTasks();
+    detail::BlockingRead::CheckFinished(read, accepted);
 }
 
-void MKScreenBitmap::getBitmapDataRT(Rect const& r, void* destination) {
+void MKScreenBitmap::getBitmapDataRT(Rect const& r, void* destination,
+                                     detail::BlockingRead::Ptr const& read) {
     ReadBlock(r, destination);
+    if (read) read->Finish(0);
     Unref();
 }
 
@@ -67,9 +71,9 @@ void MKScreenBitmap::GetBitmapDataAsync(Rect const& r, void* destination, void* 
 
 void MKScreenBitmap::getBitmapDataAsyncRT(Rect const& r, void* destination, void* userData,
                                           DataCallback callback) {
+    auto const self = RefPtr<MKScreenBitmap>::Adopt(this);
     ReadBlock(r, destination);
     if (callback) callback(r, destination, userData);
-    Unref();
 }
 
 } // namespace Moka

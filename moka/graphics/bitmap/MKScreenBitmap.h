@@ -5,13 +5,14 @@
 // Thread: any, except that the blocking reads wait for the render thread and so must not be called on it.
 #pragma once
 
+#include "moka/graphics/bitmap/BlockingRead.h"
 #include "moka/graphics/bitmap/MKScreenBitmapBase.h"
 
 #include <utility>
 
 namespace Moka {
 
-class MOKA_API MKScreenBitmap final : public MKScreenBitmapBase {
+class MOKA_API MKScreenBitmap : public MKScreenBitmapBase {
 public:
     MKScreenBitmap(IGLMsgQueue* queue, int x, int y, int width, int height, FramebufferType type);
     ~MKScreenBitmap() override;
@@ -27,16 +28,16 @@ public:
     void GetBitmapDataAsync(Rect const& r, void* destination, void* userData, DataCallback callback) override;
 
 private:
-    // Run by tasks; each drops the task's reference at its end.
+    // Run by tasks; each drops the task's reference at its end, also when a callback throws.
     void createRenderTargetRT(int width, int height, FramebufferType type, bool release);
     void getPixelRT(unsigned int& result, Point const& p);
     void getPixelAsyncRT(Point const& p, void* userData, PixelCallback callback);
-    void getBitmapDataRT(Rect const& r, void* destination);
+    void getBitmapDataRT(Rect const& r, void* destination, detail::BlockingRead::Ptr const& read);
     void getBitmapDataAsyncRT(Rect const& r, void* destination, void* userData, DataCallback callback);
 
-    // Takes the task's reference and posts.
+    // Takes the task's reference and posts. False when the task never runs.
     template <class F, class... Values>
-    void PostSelf(F function, Values&&... values);
+    bool PostSelf(F function, Values&&... values);
 };
 
 } // namespace Moka

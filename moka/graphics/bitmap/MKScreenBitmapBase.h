@@ -39,6 +39,7 @@ public:
     void DetachFromCanvas() override { Unref(); }
     void AttachToCanvasRT(bool release) override;
     void DetachFromCanvasRT(bool release) override;
+    bool HasFrameBufferRT(int) override { return mRenderTarget != nullptr; }
 
 protected:
     MKScreenBitmapBase(IGLMsgQueue* queue, int x, int y, int width, int height, FramebufferType type);

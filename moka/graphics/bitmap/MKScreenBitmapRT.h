@@ -7,7 +7,7 @@
 
 namespace Moka {
 
-class MOKA_API MKScreenBitmapRT final : public MKScreenBitmapBase {
+class MOKA_API MKScreenBitmapRT : public MKScreenBitmapBase {
 public:
     MKScreenBitmapRT(IGLMsgQueue* queue, int x, int y, int width, int height, FramebufferType type);
     ~MKScreenBitmapRT() override;

@@ -6,7 +6,7 @@
 
 namespace Moka {
 
-class MOKA_API MKSharedTextureBitmap final : public MKTextureBitmap {
+class MOKA_API MKSharedTextureBitmap : public MKTextureBitmap {
 public:
     // parent has a texture bitmap; the factory has looked.
     MKSharedTextureBitmap(IGLMsgQueue* queue, IMKBitmap* parent, bool renderThread);

@@ -8,9 +8,9 @@
 namespace Moka {
 
 template <class F, class... Values>
-void MKSubBitmap::PostSelf(F function, Values&&... values) {
+bool MKSubBitmap::PostSelf(F function, Values&&... values) {
     Ref();
-    WorkerTask::PostMember(mMsgQueue, this, function, std::forward<Values>(values)...);
+    return WorkerTask::PostMember(mMsgQueue, this, function, std::forward<Values>(values)...);
 }
 
 MKSubBitmap::MKSubBitmap(IGLMsgQueue* queue, int index, Rect const& rect, int width, int, void const* pixels,
@@ -107,37 +107,42 @@ void MKSubBitmap::updateBitmapRectRT(Rect const& r, void const* pixels, int stri
 }
 
 unsigned int MKSubBitmap::GetPixel(Point const& p) {
-    unsigned int pixel = 0;
-    PostSelf(&MKSubBitmap::getPixelRT, p, &pixel, nullptr, nullptr);
+    auto const read = detail::BlockingRead::Make();
+    PostSelf(&MKSubBitmap::getPixelRT, p, read, nullptr, nullptr);
     mMsgQueue->WaitForTasks();
-    return pixel;
+    return detail::BlockingRead::GetPixel(read);
 }
 
 void MKSubBitmap::GetPixelAsync(Point const& p, void* userData, PixelCallback callback) {
-    PostSelf(&MKSubBitmap::getPixelRT, p, nullptr, userData, callback);
+    PostSelf(&MKSubBitmap::getPixelRT, p, detail::BlockingRead::Ptr(), userData, callback);
 }
 
-void MKSubBitmap::getPixelRT(Point const& p, unsigned int* result, void* userData, PixelCallback callback) {
+void MKSubBitmap::getPixelRT(Point const& p, detail::BlockingRead::Ptr const& read, void* userData,
+                             PixelCallback callback) {
+    auto const self = RefPtr<MKSubBitmap>::Adopt(this);
     unsigned int const pixel = ReadPixel(p);
-    if (result) *result = pixel;
+    if (read) read->Finish(pixel);
     if (callback) callback(pixel, userData);
-    Unref();
 }
 
 void MKSubBitmap::GetBitmapData(Rect const& r, void* destination) {
-    PostSelf(&MKSubBitmap::getBitmapDataRT, r, destination, nullptr, nullptr);
+    auto const read = detail::BlockingRead::Make();
+    bool const accepted = PostSelf(&MKSubBitmap::getBitmapDataRT, r, destination, read, nullptr, nullptr);
     mMsgQueue->WaitForTasks();
+    detail::BlockingRead::CheckFinished(read, accepted);
 }
 
 void MKSubBitmap::GetBitmapDataAsync(Rect const& r, void* destination, void* userData,
                                      DataCallback callback) {
-    PostSelf(&MKSubBitmap::getBitmapDataRT, r, destination, userData, callback);
+    PostSelf(&MKSubBitmap::getBitmapDataRT, r, destination, detail::BlockingRead::Ptr(), userData, callback);
 }
 
-void MKSubBitmap::getBitmapDataRT(Rect const& r, void* destination, void* userData, DataCallback callback) {
+void MKSubBitmap::getBitmapDataRT(Rect const& r, void* destination, detail::BlockingRead::Ptr const& read,
+                                  void* userData, DataCallback callback) {
+    auto const self = RefPtr<MKSubBitmap>::Adopt(this);
     ReadBlock(r, destination);
+    if (read) read->Finish(0);
     if (callback) callback(r, destination, userData);
-    Unref();
 }
 
 void MKSubBitmap::SetTag(char const* tag) {

@@ -7,6 +7,7 @@
 #pragma once
 
 #include "moka/graphics/bitmap/BitmapTag.h"
+#include "moka/graphics/bitmap/BlockingRead.h"
 #include "moka/graphics/bitmap/MKSubBitmapBase.h"
 
 #include <mutex>
@@ -14,7 +15,7 @@
 
 namespace Moka {
 
-class MOKA_API MKSubBitmap final : public MKSubBitmapBase {
+class MOKA_API MKSubBitmap : public MKSubBitmapBase {
 public:
     // A texture over the strip's rows of pixels, an image `width` pixels wide that stays valid until the task
     // has run; null for a transparent one.
@@ -47,23 +48,25 @@ public:
     IMKSubBitmap* Clone() override;
 
 private:
-    // Run by tasks; each drops the task's reference at its end.
+    // Run by tasks; each drops the task's reference at its end, also when a callback throws.
     void createTextureRT(int x, int y, int rowLength, void const* pixels, bool textureFlag);
     void createSharedTextureRT(IMKSubBitmap* model);
     void attachDepthBufferRT();
     void detachDepthBufferRT();
     void updateBitmapRT(void const* pixels, int stride);
     void updateBitmapRectRT(Rect const& r, void const* pixels, int stride);
-    void getPixelRT(Point const& p, unsigned int* result, void* userData, PixelCallback callback);
-    void getBitmapDataRT(Rect const& r, void* destination, void* userData, DataCallback callback);
+    void getPixelRT(Point const& p, detail::BlockingRead::Ptr const& read, void* userData,
+                    PixelCallback callback);
+    void getBitmapDataRT(Rect const& r, void* destination, detail::BlockingRead::Ptr const& read,
+                         void* userData, DataCallback callback);
     void setTagRT(char const* tag);
     void copyTextureRT(MKSubBitmapBase* target);
 
     detail::BitmapTag CopyTag();
 
-    // Takes the task's reference and posts.
+    // Takes the task's reference and posts. False when the task never runs.
     template <class F, class... Values>
-    void PostSelf(F function, Values&&... values);
+    bool PostSelf(F function, Values&&... values);
 
     std::mutex mTagLock; // the caller writes the tag, the render thread reads it
     detail::BitmapTag mTag;

@@ -34,6 +34,8 @@ public:
     // texture row 0 at the first row of the frame buffer.
     Matrix4<float> GetProjectionMatrix() override { return mProjection; }
 
+    // False also when the renderer refused it.
+    bool HasFrameBufferRT() { return GetRenderTarget() != nullptr; }
     void CreateFrameBufferRT(bool release) override;
     void ReleaseFrameBufferRT(bool release) override;
     void AttachStencilBufferRT(bool release) override;

@@ -1,6 +1,5 @@
 #include "moka/graphics/bitmap/MKSubBitmapRT.h"
 
-#include "moka/graphics/bitmap/BitmapTag.h"
 #include "moka/graphics/bitmap/MKDepthStencilBuffer.h"
 #include "moka/graphics/bitmap/MKFrameBuffer.h"
 #include "moka/renderer/ITextureObject.h"
@@ -44,10 +43,7 @@ void MKSubBitmapRT::GetBitmapDataAsync(Rect const& r, void* destination, void* u
 
 void MKSubBitmapRT::SetTag(char const* tag) {
     ITextureObject* const texture = mTexture;
-    if (!tag || !texture) return;
-    detail::BitmapTag cut;
-    cut.Set(tag);
-    texture->SetLabel(cut.Get());
+    if (tag && texture) texture->SetLabel(tag);
 }
 
 IMKSubBitmap* MKSubBitmapRT::Clone() {

@@ -7,7 +7,7 @@
 
 namespace Moka {
 
-class MOKA_API MKSubBitmapRT final : public MKSubBitmapBase {
+class MOKA_API MKSubBitmapRT : public MKSubBitmapBase {
 public:
     // A texture over the strip's rows of pixels, an image `width` pixels wide; null for a transparent one.
     MKSubBitmapRT(IGLMsgQueue* queue, int index, Rect const& rect, int width, int height, void const* pixels,
@@ -40,6 +40,7 @@ public:
     void GetPixelAsync(Point const& p, void* userData, PixelCallback callback) override;
     void GetBitmapData(Rect const& r, void* destination) override { ReadBlock(r, destination); }
     void GetBitmapDataAsync(Rect const& r, void* destination, void* userData, DataCallback callback) override;
+    // The texture's label, whole: unlike that of the other flavour it is not cut.
     void SetTag(char const* tag) override;
     IMKSubBitmap* Clone() override;
 };

@@ -1,5 +1,6 @@
 #include "moka/graphics/bitmap/MKTextureBitmap.h"
 
+#include "moka/base/RefPtr.h"
 #include "moka/graphics/bitmap/MKGraphicsFactory.h"
 #include "moka/graphics/bitmap/MKSubBitmap.h"
 #include "moka/graphics/bitmap/MKSubBitmapRT.h"
@@ -123,6 +124,8 @@ void MKTextureBitmap::GetBitmapData(Rect const& r, void* destination) {
 
 void MKTextureBitmap::GetBitmapDataAsync(Rect const& r, void* destination, void* userData,
                                          DataCallback callback) {
+    // The callback may drop the last reference while the strips are being walked.
+    auto const self = RefPtr<MKTextureBitmap>::Share(this);
     IMKSubBitmap* last = nullptr;
     ForEachStrip([&](IMKSubBitmap* strip) { last = strip; });
     ForEachStrip([&](IMKSubBitmap* strip) {
@@ -137,8 +140,8 @@ void MKTextureBitmap::GetBitmapDataAsync(Rect const& r, void* destination, void*
 }
 
 void MKTextureBitmap::CallBackRT(Rect const& r, void* destination, void* userData, DataCallback callback) {
+    auto const self = RefPtr<MKTextureBitmap>::Adopt(this);
     callback(r, destination, userData);
-    Unref();
 }
 
 void MKTextureBitmap::SetTag(char const* tag) {
@@ -269,6 +272,12 @@ void MKTextureBitmap::DetachFromCanvasRT(bool release) {
     ForEachStrip([](IMKSubBitmap* strip) { strip->ReleaseFrameBufferRT(false); });
     Unref();
     if (release) Unref();
+}
+
+bool MKTextureBitmap::HasFrameBufferRT(int strip) {
+    // Every strip was created here.
+    auto* const wanted = static_cast<MKSubBitmapBase*>(mSubBitmaps.GetAt(strip < 0 ? 0 : strip));
+    return wanted && wanted->HasFrameBufferRT();
 }
 
 } // namespace Moka

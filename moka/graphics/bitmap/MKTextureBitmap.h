@@ -93,6 +93,7 @@ public:
     void DetachFromCanvas() override;
     void AttachToCanvasRT(bool release) override;
     void DetachFromCanvasRT(bool release) override;
+    bool HasFrameBufferRT(int strip) override;
 
 private:
     void BuildStrips(Rect const& region, void const* pixels, bool renderThread, bool textureFlag);

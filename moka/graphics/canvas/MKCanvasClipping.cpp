@@ -34,6 +34,8 @@ MKCanvasClipping::MKCanvasClipping(IMKBitmap* bitmap)
       mPlainState(RendererFactory::CreateDepthStencilState(DepthStencilStateDescriptor(false, false))) {}
 
 MKCanvasClipping::~MKCanvasClipping() {
+    mStencil.Release();
+    mPlainState.reset();
     for (std::size_t i = 0; i < mStencilAttached.size(); ++i) DetachStencil(static_cast<int>(i));
 }
 

@@ -62,8 +62,8 @@ private:
     ScissorRect mScissor; // of the list, in the target
     int mActiveFrameBuffer = -1;
     std::vector<bool> mStencilAttached; // by strip
-    detail::RendererPtr<IDepthStencilState> mPlainState;
     detail::StencilClip mStencil;
+    detail::RendererPtr<IDepthStencilState> mPlainState;
 };
 
 } // namespace Moka

@@ -62,7 +62,14 @@ void LogLineDrawableCreated() {
 MKCanvasImpl::MKCanvasImpl(IGLMsgQueue* queue, IMKBitmap* bitmap, bool onRenderThread)
     : MKCanvasImplBase(queue, bitmap, onRenderThread), mQueue(queue) {}
 
-MKCanvasImpl::~MKCanvasImpl() = default;
+MKCanvasImpl::~MKCanvasImpl() {
+    DeleteClipping();
+    mLineDrawable.reset();
+    mRectDrawable.reset();
+    mRoundRectDrawable.reset();
+    mCircleDrawable.reset();
+    mBitmapDrawable.reset();
+}
 
 template <class DrawCall>
 void MKCanvasImpl::DrawInto(IMKBitmapWritable* writable, int index, Matrix3<float> const& m,
@@ -201,6 +208,7 @@ void MKCanvasImpl::DrawBitmapsRT(IMKBitmap* src, RectF const& srcRect, std::vect
     std::unique_ptr<std::vector<RectF>> const dsts(dstRects);
     IMKBitmapWritable* const writable = GetBitmap()->GetBitmapWritable();
     if (!held || !dsts || !writable || !FindOrMake(mBitmapDrawable, mQueue)) return;
+    if (!HasFrameBuffer(-1)) return;
     RectF const srcBounds(src->GetBitmapRect());
     if (!srcRect.IsIntersect(srcBounds)) return;
     RectF const bounds(GetBitmap()->GetBitmapRect());

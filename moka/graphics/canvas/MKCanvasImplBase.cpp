@@ -52,6 +52,11 @@ void MKCanvasImplBase::createClippingRT() {
     }
 }
 
+bool MKCanvasImplBase::HasFrameBuffer(int index) const {
+    IMKBitmapCanvasAttachable* const attachable = GetBitmap()->GetBitmapCanvasAttachable();
+    return !attachable || attachable->HasFrameBufferRT(index);
+}
+
 void MKCanvasImplBase::ClearRT(Vector4<float> const& rgba) {
     bool const clipped = mClipping && mClipping->HasClips();
     ForEachFrameBuffer([&](FrameBuffer const& frame) {

@@ -55,7 +55,13 @@ protected:
     MKCanvasImplBase(IGLMsgQueue* queue, IMKBitmap* bitmap, bool onRenderThread);
 
     MKCanvasClipping* GetClipping() const { return mClipping.get(); }
+    void DeleteClipping() { mClipping.reset(); }
 
+    // Of a strip, or with -1 of the target as one. What would be drawn without one is dropped: it would go to
+    // whatever the host has bound.
+    bool HasFrameBuffer(int index) const;
+
+    // Those that exist.
     template <class Action>
     void ForEachFrameBuffer(Action const& action) const;
 
@@ -78,13 +84,14 @@ void MKCanvasImplBase::ForEachFrameBuffer(Action const& action) const {
     IMKBitmap* const bitmap = GetBitmap();
     IMKTextureBitmap* const tiled = bitmap->GetTextureBitmap();
     if (!tiled) {
-        if (IMKBitmapWritable* const writable = bitmap->GetBitmapWritable())
-            action(FrameBuffer{writable, bitmap->GetBitmapRect(), -1});
+        IMKBitmapWritable* const writable = bitmap->GetBitmapWritable();
+        if (writable && HasFrameBuffer(-1)) action(FrameBuffer{writable, bitmap->GetBitmapRect(), -1});
         return;
     }
-    for (int i = 0; i < tiled->GetSubBitmapCount(); ++i)
-        if (IMKSubBitmap* const strip = tiled->GetSubBitmap(i))
-            action(FrameBuffer{strip, strip->GetBitmapRect(), i});
+    for (int i = 0; i < tiled->GetSubBitmapCount(); ++i) {
+        IMKSubBitmap* const strip = tiled->GetSubBitmap(i);
+        if (strip && HasFrameBuffer(i)) action(FrameBuffer{strip, strip->GetBitmapRect(), i});
+    }
 }
 
 } // namespace Moka

@@ -1,5 +1,6 @@
 #include "moka/graphics/canvas/MKPenCanvasImpl.h"
 
+#include "moka/base/log/AndroidLog.h"
 #include "moka/renderer/RendererFactory.h"
 
 namespace Moka {
@@ -25,7 +26,15 @@ void MKPenCanvasImpl::SwitchColorWritesOn() {
 }
 
 void MKPenCanvasImpl::EnableClipRT(int) {
-    if (MKCanvasClipping* const clipping = GetClipping()) clipping->EnableClipRT(-1);
+    if (!HasFrameBuffer(-1)) {
+        // The clip of a stencil would be drawn into somebody else's.
+        __android_log_print(ANDROID_LOG_ERROR, "mok_log",
+                            "MKPenCanvasImpl::EnableClipRT: the bitmap (\"%s\") has no frame buffer; what is "
+                            "drawn now goes to the one that the host has bound, so draw nothing",
+                            GetBitmap()->GetTag());
+    } else if (MKCanvasClipping* const clipping = GetClipping()) {
+        clipping->EnableClipRT(-1);
+    }
     SwitchColorWritesOn();
     RendererFactory::Commit(); // what is drawn next is not drawn through the renderer
 }

@@ -17,6 +17,7 @@ public:
     // From the target's pixels to clip space.
     Matrix4<float> GetCanvasMatrix() const;
 
+    // Without a frame buffer no clip is made, and an error line says so.
     // A pen canvas draws into the bitmap as one frame buffer, whatever the index. Relied upon.
     void EnableClipRT(int frameBuffer);
     void DisableClipRT();

@@ -34,27 +34,40 @@ float Sum(int a, int b) { return static_cast<float>(std::int64_t{a} + b); }
 } // namespace
 
 StencilClip::StencilClip()
-    : mClipGeometry(CreateGeometry()),
+    : mShader(GetShader<MKRectShader>()),
+      mClipGeometry(CreateGeometry()),
       mScreenGeometry(CreateGeometry()),
       mDepthStencil(RendererFactory::CreateDepthStencilState(DepthStencilStateDescriptor(false, true))),
-      mBlend(RendererFactory::CreateBlendStateObject(BlendStateDescriptor(false))),
-      mShader(GetShader<MKRectShader>()) {
+      mBlend(RendererFactory::CreateBlendStateObject(BlendStateDescriptor(false))) {
     if (mScreenGeometry) SetRectangle(*mScreenGeometry, -1, -1, 1, 1);
 }
 
 StencilClip::~StencilClip() = default;
+
+void StencilClip::Release() {
+    mShader.reset();
+    mClipGeometry.reset();
+    mScreenGeometry.reset();
+    mDepthStencil.reset();
+    mBlend.reset();
+}
 
 bool StencilClip::IsReady() const {
     return mClipGeometry && mScreenGeometry && mDepthStencil && mBlend && mShader;
 }
 
 void StencilClip::Draw(ClipList const& clips, IMKBitmapWritable& frameBuffer) {
-    ClearStencil(frameBuffer, HasReplace(clips) ? 0 : 1);
-    if (!IsReady()) return;
+    int const initial = HasReplace(clips) ? 0 : 1;
+    if (!IsReady()) {
+        ClearStencil(frameBuffer, initial);
+        return;
+    }
     BlendStateDescriptor colorOff(false);
     mBlend->SetDescriptor(colorOff);
     mBlend->Apply();
+    mDepthStencil->Apply();
     mShader->program->MakeCurrent();
+    ClearStencil(frameBuffer, initial);
     DrawClips(clips, frameBuffer);
     AllowWhereOne();
     // Whoever draws next need not set a blend state of its own.

@@ -23,6 +23,8 @@ class StencilClip {
 public:
     StencilClip();
     ~StencilClip();
+    // Gives back what the constructor made; nothing can be drawn afterwards.
+    void Release();
     StencilClip(StencilClip const&) = delete;
     StencilClip& operator=(StencilClip const&) = delete;
 
@@ -45,11 +47,11 @@ private:
     void Pass(Area const& area, StencilComparison comparison, int reference, StencilOperation operation);
     void AllowWhereOne();
 
+    ShaderPtr<MKRectShader> mShader;
     RendererPtr<IGraphicsObject> mClipGeometry;
     RendererPtr<IGraphicsObject> mScreenGeometry;
     RendererPtr<IDepthStencilState> mDepthStencil;
     RendererPtr<IBlendStateObject> mBlend;
-    ShaderPtr<MKRectShader> mShader;
 };
 
 } // namespace detail

@@ -12,8 +12,7 @@ DrawState::DrawState()
       mDepthStencil(RendererFactory::CreateDepthStencilState(DepthStencilStateDescriptor(false, false))) {}
 
 void DrawState::ApplyBlend(MKPaint::XFermode mode) {
-    if (mode != mMode) mBlend->SetDescriptor(MKGraphicsUtil::GetBlendingStateDescriptor(mode));
-    mMode = mode;
+    mBlend->SetDescriptor(MKGraphicsUtil::GetBlendingStateDescriptor(mode));
     mBlend->Apply();
 }
 

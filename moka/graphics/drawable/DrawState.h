@@ -8,8 +8,6 @@
 #include "moka/renderer/IBlendStateObject.h"
 #include "moka/renderer/IDepthStencilState.h"
 
-#include <optional>
-
 namespace Moka::detail {
 
 class DrawState {
@@ -19,7 +17,7 @@ public:
 
     explicit operator bool() const { return mBlend && mDepthStencil; }
 
-    // Both ask for a state that is true.
+    // Both ask for a state that is true. A mode is set at each draw: the renderer knows what is in force.
     void ApplyBlend(MKPaint::XFermode mode);
     void ApplyDepthStencil() { mDepthStencil->Apply(); }
 
@@ -31,7 +29,6 @@ public:
 private:
     RendererPtr<IBlendStateObject> mBlend;
     RendererPtr<IDepthStencilState> mDepthStencil;
-    std::optional<MKPaint::XFermode> mMode; // that the blend state has
 };
 
 } // namespace Moka::detail

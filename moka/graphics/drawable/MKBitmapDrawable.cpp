@@ -66,6 +66,10 @@ MKBitmapDrawable::MKBitmapDrawable(IGLMsgQueue* queue)
 MKBitmapDrawable::~MKBitmapDrawable() {
     mGraphics.reset();
     mState.Release();
+    mPlainShader.reset();
+    mClampShader.reset();
+    mAdvancedShader.reset();
+    mDestination = {};
 }
 
 bool MKBitmapDrawable::IsReady() const {
@@ -119,13 +123,18 @@ bool MKBitmapDrawable::DarkenOrLighten(IMKBitmapReadable* bitmap, RectF const& t
                                        char const* copyTag, Matrix4<float> const& projection,
                                        MKPaint const& paint) {
     if (!CopyDestination(targetBounds, copyTag)) return false;
-    UseShader(*mAdvancedShader, projection, paint);
-    mAdvancedShader->uDstTextureSize = Vector2<float>(targetBounds.GetWidth(), targetBounds.GetHeight());
-    mAdvancedShader->uBlendingMode = paint.GetXFermode() == MKPaint::Darken ? 1 : 2;
+    MKBitmapAdvancedBlendingShader& shader = *mAdvancedShader;
+    shader.program->MakeCurrent();
+    shader.uProjectionMatrix = projection;
+    shader.uColor = paint.GetColor();
+    shader.uTintColor = paint.GetTintColor();
+    shader.uDstTextureSize = Vector2<float>(targetBounds.GetWidth(), targetBounds.GetHeight());
+    shader.uHasTintColor = paint.HasTintColor() ? 1 : 0;
+    shader.uBlendingMode = paint.GetXFermode() == MKPaint::Darken ? 1 : 2;
     bitmap->ActivateTextureRT(0, false);
-    mAdvancedShader->uSrcTexture = 0;
+    shader.uSrcTexture = 0;
     mDestination->GetBitmapReadable()->ActivateTextureRT(1, false);
-    mAdvancedShader->uDstTexture = 1;
+    shader.uDstTexture = 1;
     return DrawAll(*mGraphics);
 }
 

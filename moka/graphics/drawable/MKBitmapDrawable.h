@@ -54,11 +54,11 @@ private:
 
     IGLMsgQueue* mQueue;
     detail::RendererPtr<IGraphicsObject> mGraphics;
-    RefPtr<IMKBitmap> mDestination;                 // null until the first draw that darkens or lightens
-    detail::ShaderPtr<MKBitmapShader> mPlainShader; // or
+    detail::DrawState mState;
+    detail::ShaderPtr<MKBitmapShader> mPlainShader;           // or
     detail::ShaderPtr<MKBitmapShaderColorClamp> mClampShader; // on the one GPU that needs it
     detail::ShaderPtr<MKBitmapAdvancedBlendingShader> mAdvancedShader;
-    detail::DrawState mState;
+    RefPtr<IMKBitmap> mDestination; // null until the first draw that darkens or lightens
 };
 
 } // namespace Moka

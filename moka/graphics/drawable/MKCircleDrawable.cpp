@@ -14,6 +14,7 @@ MKCircleDrawable::MKCircleDrawable()
 MKCircleDrawable::~MKCircleDrawable() {
     mGraphics.reset();
     mState.Release();
+    mShader.reset();
 }
 
 void MKCircleDrawable::DrawCircleRT(PointF const& center, float radius, Matrix4<float> const& projection,

@@ -110,6 +110,8 @@ MKLineDrawable::~MKLineDrawable() {
     mLineGraphics.reset();
     mSimpleGraphics.reset();
     mState.Release();
+    mLineShader.reset();
+    mRectShader.reset();
 }
 
 void MKLineDrawable::DrawLineRT(PointF const& start, PointF const& end, Matrix4<float> const& projection,

@@ -46,8 +46,8 @@ private:
                             MKPaint const& paint);
 
     detail::RendererPtr<IGraphicsObject> mLineGraphics;
-    detail::DrawState mState;
     detail::RendererPtr<IGraphicsObject> mSimpleGraphics;
+    detail::DrawState mState;
     detail::ShaderPtr<MKLineShader> mLineShader;
     detail::ShaderPtr<MKRectShader> mRectShader;
 };

@@ -14,6 +14,7 @@ MKRectDrawable::MKRectDrawable()
 MKRectDrawable::~MKRectDrawable() {
     mGraphics.reset();
     mState.Release();
+    mShader.reset();
 }
 
 bool MKRectDrawable::DrawRectRT(RectF const& rect, Matrix4<float> const& projection, MKPaint const& paint) {

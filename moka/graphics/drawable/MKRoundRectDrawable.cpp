@@ -100,6 +100,8 @@ MKRoundRectDrawable::~MKRoundRectDrawable() {
     mBodyGraphics.reset();
     mCornerGraphics.reset();
     mState.Release();
+    mBodyShader.reset();
+    mCornerShader.reset();
 }
 
 bool MKRoundRectDrawable::DrawRoundRectRT(RectF const& rect, float rx, float ry,

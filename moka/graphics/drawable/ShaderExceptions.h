@@ -4,31 +4,47 @@
 
 #include "moka/base/Export.h"
 
+#include <cstring>
 #include <exception>
-#include <string>
 
 namespace Moka {
+
+namespace detail {
+
+// A message that needs no memory: a mistake is told in its own words also when that ran out. Cut at 127 bytes.
+class ShaderMessage {
+public:
+    explicit ShaderMessage(char const* text) noexcept {
+        std::memcpy(mText, text, strnlen(text, sizeof mText - 1));
+    }
+    char const* Get() const noexcept { return mText; }
+
+private:
+    char mText[128] = {};
+};
+
+} // namespace detail
 
 // A uniform is of another type than the binding.
 class MOKA_API InvalidArgumentException : public std::exception {
 public:
-    explicit InvalidArgumentException(char const* message) : mMessage(message) {}
+    explicit InvalidArgumentException(char const* message) noexcept : mMessage(message) {}
     ~InvalidArgumentException() override;
-    char const* what() const noexcept override { return mMessage.c_str(); }
+    char const* what() const noexcept override { return mMessage.Get(); }
 
 private:
-    std::string mMessage;
+    detail::ShaderMessage mMessage;
 };
 
 // A value for a binding that is bound to nothing.
 class MOKA_API NotSupportedException : public std::exception {
 public:
-    explicit NotSupportedException(char const* message) : mMessage(message) {}
+    explicit NotSupportedException(char const* message) noexcept : mMessage(message) {}
     ~NotSupportedException() override;
-    char const* what() const noexcept override { return mMessage.c_str(); }
+    char const* what() const noexcept override { return mMessage.Get(); }
 
 private:
-    std::string mMessage;
+    detail::ShaderMessage mMessage;
 };
 
 } // namespace Moka

@@ -4,9 +4,11 @@
 
 namespace Moka {
 
-// Statics elsewhere may give shaders back while the process ends.
+// In memory of its own, which is always there, and never destroyed: statics elsewhere may give shaders back while
+// the process ends.
 ShaderManager* ShaderManager::GetInstance() {
-    static ShaderManager* const instance = new ShaderManager;
+    alignas(ShaderManager) static unsigned char memory[sizeof(ShaderManager)];
+    static ShaderManager* const instance = new (memory) ShaderManager;
     return instance;
 }
 
@@ -24,10 +26,14 @@ ShaderManager::Entry* ShaderManager::Find(char const* name) {
     return found == mEntries.end() ? nullptr : &found->second;
 }
 
-ShaderManager::Entry& ShaderManager::Add(char const* name, void* shader) {
-    Entry& entry = mEntries[Key(name)];
-    entry.shader = shader;
-    return entry;
+ShaderManager::Entry* ShaderManager::Add(char const* name, void* shader) {
+    try {
+        Entry& entry = mEntries[Key(name)];
+        entry.shader = shader;
+        return &entry;
+    } catch (std::bad_alloc const&) {
+        return nullptr;
+    }
 }
 
 ShaderManager::Entries::iterator ShaderManager::FindToRelease(char const* name, void const* shader) {

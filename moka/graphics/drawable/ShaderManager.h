@@ -38,8 +38,9 @@ public:
     // Never null and never destroyed.
     static ShaderManager* GetInstance();
 
-    // The shader of the class, with one user more; give it back with ReleaseShader. Null when memory ran out
-    // for it. What its constructor throws passes through and leaves everything as it was.
+    // The shader of the class, with one user more; give it back with ReleaseShader. Null when memory ran out:
+    // for the shader, whose class then has none from here on, or for its entry, which the next call tries
+    // again. What the shader's constructor throws passes through and leaves everything as it was.
     template <class T>
     T* GetShader() {
         AutoCriticalSection const hold(mLock);
@@ -48,7 +49,8 @@ public:
         if (!entry) {
             LogNew(name);
             std::unique_ptr<T> shader(new (std::nothrow) T);
-            entry = &Add(name, shader.get());
+            entry = Add(name, shader.get());
+            if (!entry) return nullptr;
             static_cast<void>(shader.release()); // the entry's now
         }
         ++entry->users;
@@ -86,7 +88,8 @@ private:
 
     static void LogNew(char const* name);
     Entry* Find(char const* name);
-    Entry& Add(char const* name, void* shader);
+    // Null when memory ran out.
+    Entry* Add(char const* name, void* shader);
     // The end, with an error line, when the manager has none of the class or another one.
     Entries::iterator FindToRelease(char const* name, void const* shader);
 

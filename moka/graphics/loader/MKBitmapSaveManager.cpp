@@ -1,6 +1,7 @@
 #include "moka/graphics/loader/MKBitmapSaveManager.h"
 
 #include "moka/base/Handler.h"
+#include "moka/base/MessageLoop.h"
 #include "moka/base/RunGuarded.h"
 #include "moka/base/log/AndroidLog.h"
 #include "moka/graphics/bitmap/IMKBitmap.h"
@@ -23,7 +24,8 @@ void LogInfo(char const* format, Values... values) {
 } // namespace
 
 MKBitmapSaveManager::MKBitmapSaveManager() {
-    mHandler.reset(new (std::nothrow) Handler(sm_HandleMessage, this));
+    // A handler logs an error without a loop, which is a supported use of the manager.
+    if (MessageLoop::GetCurrent()) mHandler.reset(new (std::nothrow) Handler(sm_HandleMessage, this));
     MKBitmapLoader::Callback callback;
     callback.onSave = [this](int, String const&, void* save) { OnSave(save, false); };
     callback.onSaveError = [this](int, String const&, void* save) { OnSave(save, true); };

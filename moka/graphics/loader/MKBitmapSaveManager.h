@@ -71,8 +71,8 @@ private:
     ConditionalVariable mCondition; // a result arrived
     CriticalSection mutable mLock{true};
     SaveList mutable mRequested;
-    SaveList mResults; // in the order of arrival
-    std::unique_ptr<Handler> mHandler;
+    SaveList mResults;                       // in the order of arrival
+    std::unique_ptr<Handler> mHandler;       // null without a message loop
     std::unique_ptr<MKBitmapLoader> mLoader; // goes first: what it still calls needs the rest
 };
 

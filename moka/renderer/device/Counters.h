@@ -12,7 +12,8 @@ namespace Moka::detail {
 // Written by one thread alone, so that counting a draw costs a plain addition.
 class Counter {
 public:
-    void operator++() { *this += 1; }
+    // One addition, in one function, because draws count.
+    void operator++() { mValue.store(mValue.load(std::memory_order_relaxed) + 1, std::memory_order_relaxed); }
     void operator+=(std::uint64_t more) { Set(*this + more); }
     void Set(std::uint64_t value) { mValue.store(value, std::memory_order_relaxed); }
     operator std::uint64_t() const { return mValue.load(std::memory_order_relaxed); }

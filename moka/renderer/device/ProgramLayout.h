@@ -36,6 +36,7 @@ struct ProgramLayout {
         std::string name;
         BindingType type;
         std::size_t offset; // bytes
+        std::size_t size;   // bytes
     };
 
     // False: the sources do not compile or link. The program then exists and draws nothing.
@@ -50,8 +51,8 @@ struct ProgramLayout {
 
     void Add(char const* name, BindingType type) {
         if (type == BindingTypeTextureUnit) samplers.push_back(uniforms.size());
-        uniforms.push_back({name, type, size});
-        size += GetValueSize(type);
+        uniforms.push_back({name, type, size, GetValueSize(type)});
+        size += uniforms.back().size;
     }
 };
 

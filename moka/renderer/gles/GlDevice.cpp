@@ -83,7 +83,11 @@ void GlDevice::Upload(DeviceName texture, PixelBlock const& block, void const* p
 }
 
 void GlDevice::ReadPixels(TargetRef const& target, PixelBlock const& block, void* pixels, int rowLength) {
-    host.BindRead(target.frameBuffer);
+    if (workarounds.Needs(GlWorkaround::BindForDrawingToRead)) {
+        host.Bind({target.frameBuffer, target.frameBuffer});
+    } else {
+        host.BindRead(target.frameBuffer);
+    }
     ReadBackPixels(state, block, pixels, rowLength);
     debug.Check("reading pixels back");
 }

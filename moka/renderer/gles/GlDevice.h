@@ -11,6 +11,7 @@
 #include "moka/renderer/gles/GlState.h"
 #include "moka/renderer/gles/GlSubmitter.h"
 #include "moka/renderer/gles/GlVertexFormats.h"
+#include "moka/renderer/gles/GlWorkarounds.h"
 
 namespace Moka::detail {
 
@@ -46,6 +47,7 @@ public:
     void BindTexture(TextureRef const& texture);
 
     Counters& counters;
+    GlWorkarounds const workarounds;
     GlState state;
     GlDebug debug;
     GlHostState host{state};

@@ -63,9 +63,8 @@ void GlPrograms::Apply(GLuint name, unsigned char const* values) {
 void GlPrograms::Send(Program& program, std::size_t index, unsigned char const* values) {
     ProgramLayout::Uniform const& uniform = program.layout.uniforms[index];
     unsigned char* const sent = &program.sent[uniform.offset];
-    std::size_t const size = GetValueSize(uniform.type);
-    if (std::memcmp(sent, values + uniform.offset, size) == 0) return;
-    std::memcpy(sent, values + uniform.offset, size);
+    if (std::memcmp(sent, values + uniform.offset, uniform.size) == 0) return;
+    std::memcpy(sent, values + uniform.offset, uniform.size);
     // Every value starts at a multiple of four bytes.
     void const* const aligned = sent;
     auto const* const floats = static_cast<GLfloat const*>(aligned);

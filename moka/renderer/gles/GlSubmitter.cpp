@@ -103,7 +103,7 @@ void GlSubmitter::Execute(Discard const& discard) {
 }
 
 void GlSubmitter::Execute(TargetCopy const& copy) {
-    mApplied = nullptr;
+    BeginCopy();
     if (HasAlpha(copy.from)) {
         mDevice.host.BindRead(copy.from.frameBuffer);
         GlEditTexture const edit(mDevice.state, copy.to.texture);
@@ -113,6 +113,11 @@ void GlSubmitter::Execute(TargetCopy const& copy) {
         Blit(copy.from, copy.to, copy.width, copy.height);
     }
     ++mDevice.counters.copies;
+}
+
+void GlSubmitter::BeginCopy() {
+    mApplied = nullptr;
+    if (mDevice.workarounds.Needs(GlWorkaround::FinishBeforeCopies)) Gl::Finish();
 }
 
 // A host may bind another surface under the same name, so the answer cannot be kept. It is cheap beside the
@@ -127,7 +132,7 @@ bool GlSubmitter::HasAlpha(TargetRef const& target) {
 }
 
 void GlSubmitter::Execute(TextureDraw const& draw) {
-    mApplied = nullptr;
+    BeginCopy();
     Blit(draw.from, draw.to, draw.from.width, draw.from.height);
     ++mDevice.counters.copies;
 }

@@ -26,6 +26,7 @@ private:
     void Apply(DrawState const& state);
     void BindForClear(TargetRef const& target);
     void ClearColor(float const* color);
+    void BeginCopy();
     bool HasAlpha(TargetRef const& target);
     void Blit(TargetRef const& from, TargetRef const& to, int width, int height);
 

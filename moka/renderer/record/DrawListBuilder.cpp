@@ -45,14 +45,13 @@ std::size_t DrawListBuilder::AddState(DrawState const& state, bool isKnownSame) 
 
 std::size_t DrawListBuilder::AddValues(ProgramState& program) {
     ProgramState::Listed& listed = program.listed;
-    unsigned char const* const values = program.GetValues();
-    std::size_t const size = program.GetSize();
+    std::vector<unsigned char> const& values = program.GetValues();
     bool const isHere = listed.list == mNumber;
-    bool const isSame =
-        isHere && (!listed.isStale || std::memcmp(&mList.uniforms[listed.offset], values, size) == 0);
+    bool const isSame = isHere && (!listed.isStale || std::memcmp(&mList.uniforms[listed.offset],
+                                                                  values.data(), values.size()) == 0);
     if (!isSame) {
         listed.offset = mList.uniforms.size();
-        mList.uniforms.insert(mList.uniforms.end(), values, values + size);
+        mList.uniforms.insert(mList.uniforms.end(), values.begin(), values.end());
         listed.list = mNumber;
     }
     listed.isStale = false;

@@ -52,7 +52,7 @@ void GraphicsObject::HandOver(float const* data, int count) {
 }
 
 bool GraphicsObject::Draw(int first, int count, int instances) {
-    Observe(ObjectKind::kGraphicsObject, this, "Draw", first, count, instances);
+    if (theObserver) Observe(ObjectKind::kGraphicsObject, this, "Draw", first, count, instances);
     RequestScope const scope(*mRecorder);
     if (!scope) return false;
     if (instances != 1) {
@@ -70,7 +70,7 @@ bool GraphicsObject::Draw(int first, int count, int instances) {
                              mFloatsPerVertex, start, drawn});
     }
     try {
-        return mRecorder->Draw(*this, start, drawn);
+        return mRecorder->Draw(*this, mFormat, mPrimitive, start, drawn);
     } catch (std::bad_alloc const&) {
         // What was recorded before needs no more memory.
         mRecorder->Flush();

@@ -29,8 +29,6 @@ public:
     bool Draw(int first, int count, int instances) override;
     void Release() override;
 
-    int GetFormat() const { return mFormat; }
-    PrimitiveType GetPrimitive() const { return mPrimitive; }
     // Within a request: the vertices in the present list. Throws bad_alloc.
     ListVertices const& PlaceVertices();
     // The list is about to be cleared. Without memory the object has no vertices afterwards.

@@ -94,6 +94,7 @@ public:
 
 extern RecorderObserver* theObserver;
 
+// Requests that every draw makes test theObserver themselves, which saves the call.
 template <class... Values>
 void Observe(ObjectKind kind, void const* object, char const* operation, Values const&... values) {
     if (theObserver) theObserver->OnRequest({kind, object, operation, {RequestValue(values)...}});

@@ -47,7 +47,7 @@ void ProgramState::CopyValues(ProgramLayout const& layout, std::vector<unsigned 
     for (ProgramLayout::Uniform const& old : mLayout.uniforms) {
         std::size_t const index = Find(layout, old.name);
         if (index == kNoUniform || layout.uniforms[index].type != old.type) continue;
-        std::memcpy(&values[layout.uniforms[index].offset], &mValues[old.offset], GetValueSize(old.type));
+        std::memcpy(&values[layout.uniforms[index].offset], &mValues[old.offset], old.size);
     }
 }
 
@@ -86,7 +86,7 @@ bool ProgramState::Set(std::size_t handle, void const* value) {
     std::int32_t const flag = uniform.type == BindingTypeBool && *static_cast<bool const*>(value) ? 1 : 0;
     void const* const converted = uniform.type == BindingTypeBool ? &flag : value;
     unsigned char* const kept = &mValues[uniform.offset];
-    std::size_t const size = GetValueSize(uniform.type);
+    std::size_t const size = uniform.size;
     if (std::memcmp(kept, converted, size) == 0) return false;
     std::memcpy(kept, converted, size);
     listed.isStale = true;

@@ -23,7 +23,8 @@ public:
 
     // Within a request: belongs to recorder from now on. False: released, or the driver made no program.
     bool BuildIn(std::shared_ptr<Recorder> const& recorder);
-    bool IsBuiltIn(Recorder const& recorder) const { return mRecorder.get() == &recorder && mName != 0; }
+    // Of the context that it was built in; null before.
+    Recorder* GetRecorder() const { return mRecorder.get(); }
     // Deletes the device's program; nothing builds it again.
     void Release();
 
@@ -42,8 +43,7 @@ public:
     int GetSamplerUnit(std::size_t sampler) const;
 
     // All values, as ProgramLayout places them.
-    unsigned char const* GetValues() const { return mValues.data(); }
-    std::size_t GetSize() const { return mValues.size(); }
+    std::vector<unsigned char> const& GetValues() const { return mValues; }
 
     // What the draw list has of this program.
     struct Listed {

@@ -61,7 +61,7 @@ void Recorder::End() {
     }
 }
 
-bool Recorder::Draw(GraphicsObject& object, int first, int count) {
+bool Recorder::Draw(GraphicsObject& object, int format, PrimitiveType primitive, int first, int count) {
     std::shared_ptr<ProgramState> const& program = requested->GetProgram();
     if (!program || !program->CanDraw()) return false;
     if (count <= 0) return true;
@@ -72,8 +72,9 @@ bool Recorder::Draw(GraphicsObject& object, int first, int count) {
         Flush();
         mDevice->RestoreHost(HostState::All);
     }
-    DrawState& state = requested->Resolve(GetCurrentTarget(), object.GetFormat(), object.GetPrimitive());
-    if (state.target.texture != 0) SampleCopyOfTarget(state);
+    DrawState& state =
+        requested->Resolve(mActive ? mActive->GetRef() : GetCurrentTarget(), format, primitive);
+    if (state.target.texture != 0 && program->GetSamplerCount() > 0) SampleCopyOfTarget(state);
     // Only now: a flush on the way here takes vertices out of the list.
     list.AddDraw(state, !requested->IsChanged(), *program, object.PlaceVertices(), first, count);
     requested->SetChanged(false);
@@ -108,7 +109,7 @@ void Recorder::SampleCopyOfTarget(DrawState& state) {
 }
 
 void Recorder::AfterAdding() {
-    if (mIsExternal || !mIsDeferred || list.IsFull()) Flush();
+    if (mFlushesAtOnce || list.IsFull()) Flush();
 }
 
 void Recorder::Flush() {
@@ -134,6 +135,7 @@ void Recorder::Activate(RenderTarget& target) {
     // What was drawn into another target is complete before external code sees this one bound.
     if (!mIsDeferred && mActive != &target) Flush();
     mActive = &target;
+    if (mFlushesAtOnce) End();
 }
 
 void Recorder::Deactivate(RenderTarget const& target) {
@@ -167,7 +169,7 @@ void Recorder::CommitForExternal() {
     if (mActive) commit.target = &mActive->GetRef();
     if (std::shared_ptr<ProgramState> const& program = requested->GetProgram()) {
         commit.program = program->GetName();
-        commit.values = program->GetValues();
+        commit.values = program->GetValues().data();
     }
     std::vector<TextureRef> const& textures = requested->GetTextures();
     commit.textures = textures.data();
@@ -175,10 +177,12 @@ void Recorder::CommitForExternal() {
     mDevice->Commit(commit);
     mDevice->RestoreHost(HostState::VertexInput);
     mIsExternal = true;
+    SetFlushesAtOnce();
 }
 
 void Recorder::InvalidateState() {
     mIsExternal = false;
+    SetFlushesAtOnce();
     if (!Begin()) return;
     mDevice->InvalidateState();
     requested->Forget();
@@ -188,6 +192,7 @@ void Recorder::SetDeferred(bool on) {
     if (!Begin()) return;
     Flush();
     mIsDeferred = on;
+    SetFlushesAtOnce();
     if (mActive) return;
     CommitStates();
     mDevice->RestoreHost(HostState::All);

@@ -54,7 +54,7 @@ public:
         if (!mAttached) return false;
         MOKA_CHECK(IsRenderThread(), "the renderer is used on the thread that attached it");
         // Between the library's own draws nothing can have happened.
-        if (!mIsDeferred || mIsExternal || mHasDropped) Prepare();
+        if (mFlushesAtOnce || mHasDropped) Prepare();
         return true;
     }
     // At the end of a request that may have bound something: the target is bound that the caller expects.
@@ -64,15 +64,19 @@ public:
     Device& GetDevice() { return *mDevice; }
     // Draws count of the object's vertices, from the first one on, with the requested state. False when nothing
     // can be drawn. Throws bad_alloc.
-    bool Draw(GraphicsObject& object, int first, int count);
+    bool Draw(GraphicsObject& object, int format, PrimitiveType primitive, int first, int count);
     // After anything but a draw was added to the list.
     void AfterAdding();
     void Flush();
     // Before a texture is changed or read at once.
     void FlushIfUsed(DeviceName texture);
-    // Whether a request is to reach GL at once because nothing before it waits in the list.
-    bool IsThrough() const { return (mIsExternal || !mIsDeferred) && list.IsEmpty(); }
-    void Commit(StateCommit const& commit) { mDevice->Commit(commit); }
+    // Immediate, a request that changed a state lets commit(StateCommit&) add it to what GL gets at once, unless
+    // draws before it wait in the list.
+    template <class Commit>
+    void CommitAtOnce(Commit commit) {
+        if (IsThrough()) CommitNow(commit);
+    }
+    bool IsThrough() const { return mFlushesAtOnce && list.IsEmpty(); }
 
     void Activate(RenderTarget& target);
     void Deactivate(RenderTarget const& target);
@@ -109,6 +113,13 @@ private:
         DeviceName name;
     };
 
+    template <class Commit>
+    void CommitNow(Commit commit) {
+        StateCommit state;
+        commit(state);
+        mDevice->Commit(state);
+    }
+    void SetFlushesAtOnce() { mFlushesAtOnce = mIsExternal || !mIsDeferred; }
     bool MayDeleteNow() const { return mAttached && IsRenderThread() && list.IsEmpty(); }
     void Prepare();
     void Delete(Dropped const& dropped);
@@ -120,7 +131,8 @@ private:
     std::thread::id const mRenderThread = std::this_thread::get_id();
     RenderTarget* mActive = nullptr;
     bool mIsDeferred = false;
-    bool mIsExternal = false; // between a commit and the invalidation, while GL belongs to external code
+    bool mIsExternal = false;   // between a commit and the invalidation, while GL belongs to external code
+    bool mFlushesAtOnce = true; // immediate or external
     std::vector<GraphicsObject*> mHolders;
     // A draw that samples its own target samples this copy; kept while the same size is needed.
     std::shared_ptr<TextureStorage> mTargetCopy;

@@ -27,15 +27,13 @@ RenderTarget::RenderTarget(std::shared_ptr<Recorder> recorder, std::shared_ptr<F
 RenderTarget::~RenderTarget() { --mRecorder->counters.renderTargets; }
 
 void RenderTarget::Activate() {
-    Observe(kKind, this, "Activate");
-    RequestScope const scope(*mRecorder);
-    if (scope) mRecorder->Activate(*this);
+    if (theObserver) Observe(kKind, this, "Activate");
+    if (mRecorder->Begin()) mRecorder->Activate(*this);
 }
 
 void RenderTarget::Deactivate(bool discardColor, bool discardDepthStencil) {
-    Observe(kKind, this, "Deactivate", discardColor, discardDepthStencil);
-    RequestScope const scope(*mRecorder);
-    if (!scope || mRecorder->GetActive() != this) return;
+    if (theObserver) Observe(kKind, this, "Deactivate", discardColor, discardDepthStencil);
+    if (!mRecorder->Begin() || mRecorder->GetActive() != this) return;
     if (discardColor || discardDepthStencil) {
         mRecorder->list.Add(Discard{mRef, discardColor, discardDepthStencil});
     }

@@ -279,7 +279,7 @@ IRasterizerState* RendererFactory::GetRasterizerState() {
 }
 
 void RendererFactory::SetStencilClip(bool on) {
-    Observe(kRenderer, nullptr, "SetStencilClip", on);
+    if (theObserver) Observe(kRenderer, nullptr, "SetStencilClip", on);
     if (Recorder* const recorder = GetAttachedRecorder()) recorder->requested->SetStencilClip(on);
 }
 

@@ -16,7 +16,9 @@ RequestedState::RequestedState(Device& device, int samplingUnits)
 
 void RequestedState::SetScissorEnabled(bool on) {
     mKnowsScissorTest = true;
-    Change(mDraw.scissor.on, on);
+    if (mDraw.scissor.on == on) return;
+    mDraw.scissor.on = on;
+    mChanged = true;
 }
 
 void RequestedState::SetScissorRect(ScissorRect const& rect) {
@@ -42,18 +44,22 @@ ScissorState const& RequestedState::GetScissor() {
 
 void RequestedState::SetBlend(BlendStateDescriptor const& blend) {
     mKnowsBlend = true;
-    Change(mDraw.blend, blend);
+    if (mDraw.blend == blend) return;
+    mDraw.blend = blend;
+    mChanged = true;
 }
 
 void RequestedState::SetDepthStencil(DepthStencilStateDescriptor const& depthStencil) {
     if (mStencilClip && !depthStencil.IsStencil()) return;
     mKnowsDepthStencil = true;
-    Change(mDraw.depthStencil, depthStencil);
+    if (mDraw.depthStencil == depthStencil) return;
+    mDraw.depthStencil = depthStencil;
+    mChanged = true;
 }
 
-void RequestedState::SetProgram(std::shared_ptr<ProgramState> program) {
+void RequestedState::SetProgram(std::shared_ptr<ProgramState> const& program) {
     if (mProgram == program) return;
-    mProgram = std::move(program);
+    mProgram = program;
     mChanged = true;
 }
 
@@ -64,10 +70,16 @@ void RequestedState::SetTexture(int unit, std::shared_ptr<TextureStorage> const&
 
 DrawState& RequestedState::Resolve(TargetRef const& target, int format, PrimitiveType primitive) {
     if (!mKnowsScissorTest || (mDraw.scissor.on && !mKnowsScissorRect)) GetScissor();
-    Change(mDraw.target, target);
-    Change(mDraw.format, format);
-    Change(mDraw.primitive, primitive);
-    Change(mDraw.program, mProgram->GetName());
+    DeviceName const program = mProgram->GetName();
+    bool const isSame = mDraw.target == target && mDraw.format == format && mDraw.primitive == primitive &&
+                        mDraw.program == program;
+    if (!isSame) {
+        mDraw.target = target;
+        mDraw.format = format;
+        mDraw.primitive = primitive;
+        mDraw.program = program;
+        mChanged = true;
+    }
     if (mSamples || mProgram->GetSamplerCount() > 0) ResolveTextures();
     return mDraw;
 }

@@ -36,7 +36,7 @@ public:
     DepthStencilStateDescriptor const& GetDepthStencil() const { return mDraw.depthStencil; }
     bool IsStencilClip() const { return mStencilClip; }
 
-    void SetProgram(std::shared_ptr<ProgramState> program);
+    void SetProgram(std::shared_ptr<ProgramState> const& program);
     std::shared_ptr<ProgramState> const& GetProgram() const { return mProgram; }
 
     int GetUnitCount() const { return static_cast<int>(mUnits.size()); }

@@ -14,10 +14,10 @@ namespace {
 constexpr ObjectKind kKind = ObjectKind::kProgram;
 
 void CommitProgram(Recorder& recorder, ProgramState const& program) {
-    StateCommit commit;
-    commit.program = program.GetName();
-    commit.values = program.GetValues();
-    recorder.Commit(commit);
+    recorder.CommitAtOnce([&](StateCommit& commit) {
+        commit.program = program.GetName();
+        commit.values = program.GetValues().data();
+    });
 }
 
 class Parameter final : public IParameterBinding {
@@ -34,15 +34,19 @@ public:
             theObserver->OnValue(mObject, mProgram->GetHandleName(mHandle), GetType(), value);
         }
         if (!mProgram->Set(mHandle, value)) return;
-        // Values of a program that is not the current one wait until it is. Outside of a target the host may
-        // have made a program of its own current.
-        Recorder* const recorder = GetAttachedRecorder();
-        bool const isCurrent = recorder && recorder->IsThrough() && recorder->GetActive() &&
-                               recorder->requested->GetProgram() == mProgram;
-        if (isCurrent && recorder->Begin()) CommitProgram(*recorder, *mProgram);
+        Recorder* const recorder = mProgram->GetRecorder();
+        if (recorder && recorder->IsThrough()) CommitValues(*recorder);
     }
 
 private:
+    // Values of a program that is not the current one wait until it is. Outside of a target the host may have
+    // made a program of its own current.
+    void CommitValues(Recorder& recorder) {
+        bool const isCurrent =
+            recorder.IsAttached() && recorder.GetActive() && recorder.requested->GetProgram() == mProgram;
+        if (isCurrent && recorder.Begin()) CommitProgram(recorder, *mProgram);
+    }
+
     std::shared_ptr<ProgramState> const mProgram;
     void const* const mObject; // names the program to the observer, not used otherwise
     std::size_t const mHandle;
@@ -84,10 +88,10 @@ IShaderProgram* ShaderProgram::GetInert() {
 
 void ShaderProgram::MakeCurrent() {
     IShaderProgram* const self = this;
-    Observe(kKind, self, "MakeCurrent");
+    if (theObserver) Observe(kKind, self, "MakeCurrent");
     Recorder* const recorder = GetAttachedRecorder();
     if (!recorder || !recorder->Begin()) return;
-    if (!mState->IsBuiltIn(*recorder)) {
+    if (mState->GetRecorder() != recorder) {
         try {
             mState->BuildIn(recorder->shared_from_this());
         } catch (std::bad_alloc const&) {
@@ -95,7 +99,7 @@ void ShaderProgram::MakeCurrent() {
         }
     }
     recorder->requested->SetProgram(mState);
-    if (recorder->IsThrough()) CommitProgram(*recorder, *mState);
+    CommitProgram(*recorder, *mState);
 }
 
 void ShaderProgram::Release() {

@@ -13,19 +13,14 @@ constexpr ObjectKind KindOf(DepthStencilStateDescriptor const&) { return ObjectK
 
 void ApplyTo(Recorder& recorder, BlendStateDescriptor const& descriptor) {
     recorder.requested->SetBlend(descriptor);
-    if (!recorder.IsThrough()) return;
-    StateCommit commit;
-    commit.blend = &descriptor;
-    recorder.Commit(commit);
+    recorder.CommitAtOnce([&](StateCommit& commit) { commit.blend = &descriptor; });
 }
 
 void ApplyTo(Recorder& recorder, DepthStencilStateDescriptor const& descriptor) {
     recorder.requested->SetDepthStencil(descriptor);
-    if (!recorder.IsThrough()) return;
-    StateCommit commit;
     // A stencil clip keeps its own.
-    commit.depthStencil = &recorder.requested->GetDepthStencil();
-    recorder.Commit(commit);
+    recorder.CommitAtOnce(
+        [&](StateCommit& commit) { commit.depthStencil = &recorder.requested->GetDepthStencil(); });
 }
 
 // The attached recorder, with a request begun; null without one.
@@ -52,13 +47,13 @@ StateObject<Interface, Descriptor>::~StateObject() {
 
 template <class Interface, class Descriptor>
 void StateObject<Interface, Descriptor>::SetDescriptor(Descriptor const& descriptor) {
-    Observe(KindOf(descriptor), this, "SetDescriptor");
+    if (theObserver) Observe(KindOf(descriptor), this, "SetDescriptor");
     mDescriptor = descriptor;
 }
 
 template <class Interface, class Descriptor>
 void StateObject<Interface, Descriptor>::Apply() {
-    Observe(KindOf(mDescriptor), this, "Apply");
+    if (theObserver) Observe(KindOf(mDescriptor), this, "Apply");
     if (mRecorder->Begin()) ApplyTo(*mRecorder, mDescriptor);
 }
 
@@ -77,14 +72,11 @@ bool RasterizerState::IsScissorEnabled() {
 }
 
 void RasterizerState::SetScissorEnabled(bool on) {
-    Observe(kRasterizer, nullptr, "SetScissorEnabled", on);
+    if (theObserver) Observe(kRasterizer, nullptr, "SetScissorEnabled", on);
     Recorder* const recorder = BeginRequest();
     if (!recorder) return;
     recorder->requested->SetScissorEnabled(on);
-    if (!recorder->IsThrough()) return;
-    StateCommit commit;
-    commit.scissorTest = &on;
-    recorder->Commit(commit);
+    recorder->CommitAtOnce([&](StateCommit& commit) { commit.scissorTest = &on; });
 }
 
 ScissorRect RasterizerState::GetScissorRect() {
@@ -97,10 +89,8 @@ void RasterizerState::SetScissorRect(ScissorRect const& rect) {
     Recorder* const recorder = BeginRequest();
     if (!recorder) return;
     recorder->requested->SetScissorRect(rect);
-    if (!recorder->IsThrough()) return;
-    StateCommit commit;
-    commit.scissorRect = &recorder->requested->GetScissorRect();
-    recorder->Commit(commit);
+    recorder->CommitAtOnce(
+        [&](StateCommit& commit) { commit.scissorRect = &recorder->requested->GetScissorRect(); });
 }
 
 } // namespace Moka::detail

@@ -78,12 +78,11 @@ void TextureObject::Bind(int unit) {
         return;
     }
     recorder.requested->SetTexture(unit, mStorage, mSampling);
-    if (!recorder.IsThrough()) return;
     TextureRef const texture{mStorage->GetName(), mSampling, unit};
-    StateCommit commit;
-    commit.textures = &texture;
-    commit.textureCount = 1;
-    recorder.Commit(commit);
+    recorder.CommitAtOnce([&](StateCommit& commit) {
+        commit.textures = &texture;
+        commit.textureCount = 1;
+    });
 }
 
 void TextureObject::Replace(void const* pixels, int stride) {

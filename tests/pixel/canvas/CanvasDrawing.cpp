@@ -4,6 +4,7 @@
 #include "moka/graphics/bitmap/MKGraphicsFactory.h"
 #include "moka/renderer/RendererFactory.h"
 #include "tests/support/NothingLeft.h"
+#include "tests/support/reference/ReferenceStage.h"
 
 #include <cstring>
 #include <memory>
@@ -62,16 +63,6 @@ private:
     int const mUseQueue;
 };
 
-class ReferenceStage final : public Scenes::SceneStage {
-public:
-    IMKBitmap* MakeBitmap(Scenes::Picture const& picture) override {
-        TestImage image(picture.width, picture.height);
-        image.pixels = picture.pixels;
-        return new ReferenceBitmap(image);
-    }
-    IGLMsgQueue* GetQueue() override { return nullptr; }
-};
-
 TestImage DrawOnGpu(Drawing const& drawing, IGLMsgQueue& queue, bool onRenderThread) {
     TestImage const& start = drawing.start;
     int const useQueue = onRenderThread ? 0 : 1;
@@ -111,6 +102,7 @@ RenderThread& CanvasDrawing::GetRenderThread() const { return *GetRenderer().Use
 
 void CanvasDrawing::TearDown() {
     GetRenderThread().WaitForTasks();
+    GetRenderThread().WaitForTasks(); // a canvas that goes last posts the end of its bitmap
     ExpectNothingLeft(RendererFactory::GetStatistics(), kept);
     for (std::string const& line : log.GetTexts(ANDROID_LOG_ERROR)) ADD_FAILURE() << line;
     if (kept > 0) GetRenderer().Stop();

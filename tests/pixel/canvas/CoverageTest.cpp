@@ -95,7 +95,7 @@ TEST_F(CoverageTest, EllipticCornersAndCirclesUnderMatrices) {
                            [&](IMKCanvas& canvas, MKPaint const& paint) {
                                canvas.SetMatrix(matrix);
                                canvas.DrawRoundRect(8, 8, 48, 38, 9, 6.5f, &paint);
-                               canvas.DrawRoundRect(60.25f, 8.5f, 98, 30, 40, 4, &paint);
+                               canvas.DrawRoundRect(60.25f, 8.5f, 98, 30, 40, 14, &paint);
                                canvas.DrawRoundRect(8, 50, 48, 80, 0, 5, &paint);
                                canvas.DrawCircle(76.3f, 60.7f, 14.25f, &paint);
                                canvas.DrawCircle(100, 50, 0.75f, &paint);
@@ -119,6 +119,37 @@ TEST_F(CoverageTest, LinesInEveryCapAndDashAtQuarterPixels) {
             ExpectLikeReference(drawing, "cap " + std::to_string(cap) + (dashed ? " dashed" : ""));
         }
     }
+}
+
+// Through a window of 90 x 80 units at (left, top): a mediump float of 16 bits overflows when a distance above
+// 256 is squared, and tells places above 1024 apart to a whole unit only.
+TEST_F(CoverageTest, EdgesAreAsFineFarFromTheOriginAndFarFromTheirCentre) {
+    auto const expect = [this](char const* what, float left, float top, auto const& draw) {
+        ExpectLikeReference({MakeBackdrop(90, 80),
+                             [&](IMKCanvas& canvas, Scenes::SceneStage& stage) {
+                                 canvas.PreTranslate(-left, -top);
+                                 draw(canvas, stage);
+                             }},
+                            what);
+    };
+    for (auto const style : {MKPaint::Fill, MKPaint::Stroke}) {
+        MKPaint const paint = MakePaint(style, 6, true);
+        expect("large circle", 1060, 980, [&](IMKCanvas& canvas, Scenes::SceneStage&) {
+            canvas.DrawCircle(700.25f, 1000.5f, 400, &paint);
+        });
+        expect("small circle far away", 3000, 2000, [&](IMKCanvas& canvas, Scenes::SceneStage&) {
+            canvas.DrawCircle(3040.3f, 2040.7f, 30.25f, &paint);
+        });
+    }
+    MKPaint wide = MakePaint(MKPaint::Fill, 560, true);
+    wide.SetLineCapType(MKPaint::Round);
+    expect("wide cap", 1745, 190,
+           [&](IMKCanvas& canvas, Scenes::SceneStage&) { canvas.DrawLine(400, 220, 1750, 500, &wide); });
+    MKPaint dashed = MakePaint(MKPaint::Fill, 5, true);
+    dashed.SetDashedLinePattern(Vector2<float>(9.25f, 8));
+    dashed.SetLineCapType(MKPaint::Round);
+    expect("dashes far from the start", 2920, 290,
+           [&](IMKCanvas& canvas, Scenes::SceneStage&) { canvas.DrawLine(4, 100.5f, 2990, 340, &dashed); });
 }
 
 TEST_F(CoverageTest, SimpleLinesAreSoftAlongTheirSidesOnly) {

@@ -34,22 +34,7 @@ Coverage HardStroke(RectF const& r, double h, double inset) {
     return Fragment{1};
 }
 
-// The centre and the point are stored before they are compared, their distance is computed.
-std::function<Blur(PointD const&)> BlurOfCircle(PointD const& center, double reach) {
-    double const computed = (reach + 1) * kMediumPrecision;
-    return [=](PointD const& p) {
-        return Blur{PointD{GetMediumError(p.x) + GetMediumError(center.x) + computed, 0},
-                    PointD{0, GetMediumError(p.y) + GetMediumError(center.y) + computed}};
-    };
-}
-
 } // namespace
-
-double GetMediumError(double v) {
-    if (v == 0) return 0;
-    double const step = std::exp2(std::floor(std::log2(std::abs(v)))) * kMediumPrecision;
-    return std::abs(std::round(v / step) * step - v);
-}
 
 double InsetIn(RectF const& r, PointD const& p) {
     return std::min({p.x - static_cast<double>(r.left), static_cast<double>(r.right) - p.x,
@@ -95,28 +80,24 @@ Shape StrokedRect(RectF const& rect, double width, bool antiAliased) {
 Shape FilledCircle(PointD const& center, double radius) {
     RectF const point(static_cast<float>(center.x), static_cast<float>(center.y),
                       static_cast<float>(center.x), static_cast<float>(center.y));
-    return {Grown(point, radius + 0.5),
-            [=](PointD const& p) -> Coverage {
+    return {Grown(point, radius + 0.5), [=](PointD const& p) -> Coverage {
                 double const outside = std::hypot(p.x - center.x, p.y - center.y) - radius;
                 if (outside > 0.5) return {};
                 return Fragment{std::min(1.0, 0.5 - outside)};
-            },
-            BlurOfCircle(center, radius)};
+            }};
 }
 
 // The outer ramp comes first: a stroke thinner than the ramps has a step between them.
 Shape StrokedCircle(PointD const& center, double radius, double width) {
     double const k = width / 2;
     RectF const bounds = Grown(FilledCircle(center, radius).bounds, k + 1);
-    return {bounds,
-            [=](PointD const& p) -> Coverage {
+    return {bounds, [=](PointD const& p) -> Coverage {
                 double const outside = std::hypot(p.x - center.x, p.y - center.y) - radius;
                 if (outside > k + 0.5 || outside < -k - 0.5) return {};
                 if (outside > k - 0.5) return Fragment{k + 0.5 - outside};
                 if (outside < -k + 0.5) return Fragment{outside + k + 0.5};
                 return Fragment{1};
-            },
-            BlurOfCircle(center, radius + k)};
+            }};
 }
 
 Shape SimpleLine(PointD const& from, PointD const& to, double width, bool antiAliased) {

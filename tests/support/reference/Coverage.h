@@ -5,7 +5,6 @@
 #include "moka/base/Rect.h"
 #include "tests/support/reference/Plane.h"
 
-#include <array>
 #include <functional>
 #include <optional>
 
@@ -19,20 +18,10 @@ struct Fragment {
 // Nothing where the shape makes no fragment; that differs from coverage 0 when a mode replaces.
 using Coverage = std::optional<Fragment>;
 
-using Blur = std::array<PointD, 2>;
-
 struct Shape {
     RectF bounds; // outside there are no fragments
     std::function<Coverage(PointD const&)> at;
-    // How far off in two directions a point may be found by a program that measures in medium precision, of
-    // which ten binary digits are all that can be relied on. Null when nothing is measured so.
-    std::function<Blur(PointD const&)> blur{};
 };
-
-// What ten binary digits leave open of a number of size 1.
-constexpr double kMediumPrecision = 1.0 / 1024;
-// What a number loses when it is stored in them.
-double GetMediumError(double v);
 
 // The distance to the nearest edge, positive inside. Corners are mitred: it is the minimum, so that equal
 // distances form nested rectangles.

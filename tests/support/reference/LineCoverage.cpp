@@ -7,6 +7,8 @@ namespace Moka::Testing {
 namespace {
 
 constexpr double kNowhere = 100000;
+// What single precision may lose of a number of size 1 in a few operations.
+constexpr double kRounding = 1e-6;
 
 double Clamp01(double v) { return std::min(std::max(v, 0.0), 1.0); }
 double Modulo(double x, double y) { return x - y * std::floor(x / y); }
@@ -31,9 +33,9 @@ struct LineGeometry {
     Interval FindDashed(double x) const;
     double CoverAlong(double x, double across) const;
     double CoverAcross(double across) const;
-    // Whether the length comes so near to a boundary of the pattern that it may be found on either side.
+    // Whether the length comes so near to a boundary of the pattern that single precision may find it on
+    // either side.
     bool IsEndOpen() const;
-    double BlurAt(double x) const;
 };
 
 Interval LineGeometry::FindSolid(double x) const {
@@ -85,15 +87,8 @@ double LineGeometry::CoverAcross(double across) const {
 
 bool LineGeometry::IsEndOpen() const {
     double const rest = Modulo(length, ends[3]);
-    auto const isNear = [&](double end) { return rest != end && std::abs(rest - end) < BlurAt(length); };
+    auto const isNear = [&](double end) { return rest != end && std::abs(rest - end) < length * kRounding; };
     return isNear(0) || std::any_of(ends.begin(), ends.end(), isNear);
-}
-
-// The place and the end are stored before they are compared; in the pattern also what is taken off the place.
-double LineGeometry::BlurAt(double x) const {
-    double const stored = GetMediumError(x) + (x > length / 2 ? GetMediumError(length) : 0);
-    if (!dashed) return stored + (halfWidth + 1) * kMediumPrecision;
-    return stored + GetMediumError(x - Modulo(x, ends[3])) + (ends[3] + halfWidth + 1) * kMediumPrecision;
 }
 
 LineGeometry Measure(double length, MKPaint const& paint) {
@@ -121,21 +116,14 @@ Shape Line(PointD const& from, PointD const& to, MKPaint const& paint) {
     double const reach = line.halfWidth + 0.5;
     RectF const ends(static_cast<float>(from.x), static_cast<float>(from.y), static_cast<float>(to.x),
                      static_cast<float>(to.y));
-    double const blurAcross = reach * kMediumPrecision;
     bool const endIsOpen = line.dashed && line.IsEndOpen();
     // Both ways from the corner of the quad: further than its sides reach.
-    return {Grown(Sorted(ends), 1.5 * reach),
-            [=](PointD const& p) -> Coverage {
+    return {Grown(Sorted(ends), 1.5 * reach), [=](PointD const& p) -> Coverage {
                 double const along = (p.x - from.x) * d.x + (p.y - from.y) * d.y;
                 double const across = (p.y - from.y) * d.x - (p.x - from.x) * d.y;
                 if (!(along >= -reach && along <= length + reach && std::abs(across) <= reach)) return {};
                 return Fragment{std::min(line.CoverAlong(along, across), line.CoverAcross(across)),
                                 endIsOpen && along > length - reach};
-            },
-            [=](PointD const& p) {
-                double const along = (p.x - from.x) * d.x + (p.y - from.y) * d.y;
-                double const b = line.BlurAt(along);
-                return Blur{PointD{d.x * b, d.y * b}, PointD{-d.y * blurAcross, d.x * blurAcross}};
             }};
 }
 

@@ -92,13 +92,11 @@ void ReferenceCanvas::DrawShapes(std::vector<Shape> const& shapes, RectF const& 
     painting.extent = extent;
     painting.mode = paint.GetXFermode();
     for (Shape const& shape : shapes) {
-        painting.brushes.push_back({shape.bounds,
-                                    [&](PointD const& p) -> std::optional<Ink> {
+        painting.brushes.push_back({shape.bounds, [&](PointD const& p) -> std::optional<Ink> {
                                         Coverage const c = shape.at(p);
                                         if (!c) return {};
                                         return Ink{PaintColor(paint, c->coverage), c->vague ? 255.0 : 0.0};
-                                    },
-                                    shape.blur});
+                                    }});
     }
     mRaster.Draw(painting, GetClip());
 }

@@ -58,8 +58,8 @@ Brush MakeBrush(TestImage const& image, Sampler const& sampler, BitmapQuad const
     Shape const shape = quad.GetShape();
     double const columns = (quad.rightU - quad.leftU) * image.width;
     double const rows = (quad.bottomV - quad.topV) * image.height;
-    Blur const blur{PointD{kStep * static_cast<double>(quad.dst.GetWidth()) / columns, 0},
-                    PointD{0, kStep * static_cast<double>(quad.dst.GetHeight()) / rows}};
+    std::array<PointD, 2> const blur{PointD{kStep * static_cast<double>(quad.dst.GetWidth()) / columns, 0},
+                                     PointD{0, kStep * static_cast<double>(quad.dst.GetHeight()) / rows}};
     return {shape.bounds,
             [&image, &paint, sampler, quad, shape](PointD const& p) -> std::optional<Ink> {
                 Coverage const c = shape.at(p);

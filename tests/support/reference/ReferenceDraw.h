@@ -1,6 +1,6 @@
 // ReferenceDraw: what one draw makes of one pixel, and how far off that may be: by the rounding of its
 // blends, by a jump of the picture so near to the pixel's centre that the rasteriser may find the centre on
-// either side, by what medium precision leaves open, and by anything where the definition of a shape does.
+// either side, by the weights of a texture's filter, and by anything where the definition of a shape does.
 // What is drawn over a pixel hides as much of that as it hides of the pixel.
 #pragma once
 
@@ -8,6 +8,7 @@
 #include "tests/support/reference/ClipSet.h"
 #include "tests/support/reference/Coverage.h"
 
+#include <array>
 #include <functional>
 #include <optional>
 #include <vector>
@@ -23,7 +24,8 @@ struct Ink {
 struct Brush {
     RectF bounds;
     std::function<std::optional<Ink>(PointD const&)> at;
-    std::function<Blur(PointD const&)> blur{}; // as a shape's
+    // How far off in two directions the point may be at which a texture is sampled. Null without a texture.
+    std::function<std::array<PointD, 2>(PointD const&)> blur{};
 };
 
 // What one draw puts down, in order.

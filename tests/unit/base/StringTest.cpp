@@ -62,6 +62,18 @@ TEST(StringTest, MalformedUtf8BecomesReplacementsAndTheRestIsKept) {
     for (auto const& c : cases) EXPECT_EQ(Units(String(c.utf8)), c.units) << c.what;
 }
 
+// Also those that are UTF-8 in parts, or what UTF-8 forbids: a surrogate, and a form that is too long.
+TEST(StringTest, AnyBytesOfAFileNameSurviveTheRoundTrip) {
+    for (std::string const bytes : {"plain.png", "\xE9t\xE9.png", "\xFF\xFE", "\xED\xB2\x80", "\xC0\xAF",
+                                    "\xF0\x9F\x98", "\xF0\x9F\x98\x80\x80", "\xC3\xA9/\xE9"}) {
+        String const name = String::FromFileName(bytes);
+        EXPECT_EQ(name.ToFileName(), bytes);
+        EXPECT_EQ(name.ToUtf8(), String(name.ToUtf8()).ToUtf8()) << "what is shown is UTF-8";
+    }
+    EXPECT_EQ(String::FromFileName("\xC3\xA9"), String("\xC3\xA9"));
+    EXPECT_EQ(String(u"a\xD800z", 3).ToFileName(), "a\xEF\xBF\xBDz");
+}
+
 TEST(StringTest, BufferConversionCutsAtACharacterAndTerminates) {
     String const text = FromUnits(u"aä€\U0001f600b"); // characters end at bytes 1, 3, 6, 10, 11
     std::string const whole = text.ToUtf8();

@@ -53,6 +53,18 @@ struct Seen {
     }
 };
 
+// Callbacks that throw.
+struct Thrown {
+    static void OnPixel(unsigned int, void*) { throw Thrown(); }
+    static void OnData(Rect const&, void*, void*) { throw Thrown(); }
+};
+
+// Says at once that it has caught up, as every queue does on its own thread.
+class HastyQueue final : public HandPumpedQueue {
+public:
+    void WaitForTasks() override {}
+};
+
 class BitmapFixture : public ::testing::Test {
 protected:
     static constexpr int kMaxSide = 64;
@@ -65,11 +77,13 @@ protected:
         RecordingRenderer::DeclareNoRenderThread();
         RunOnRenderThread(queue);
         RunOnRenderThread(picky);
+        RunOnRenderThread(hasty);
     }
 
     void TearDown() override {
         queue.RunAll();
         picky.RunAll();
+        hasty.RunAll();
         EXPECT_EQ(RecordingRenderer::CountLiveObjects(), mAliveBefore);
         for (std::string const& violation : RecordingRenderer::GetViolations()) ADD_FAILURE() << violation;
         RecordingRenderer::DeclareRenderThread();
@@ -115,6 +129,7 @@ protected:
     }
 
     HandPumpedQueue queue;
+    HastyQueue hasty;
     bool refuse = false; // what picky does with the next tasks
     RefusingQueue picky{RefusingQueue::Predicate([this](int, ITask*) { return refuse; })};
 

@@ -1,6 +1,8 @@
 // The factory: what it accepts, what it says when it does not, how it decodes.
 #include "moka/base/log/AndroidLog.h"
 #include "moka/graphics/bitmap/ImageDecoding.h"
+#include "moka/graphics/canvas/IMKCanvas.h"
+#include "moka/graphics/canvas/IMKPenCanvas.h"
 #include "tests/unit/bitmap/FactoryFixture.h"
 
 #include <string>
@@ -53,6 +55,36 @@ TEST_F(Factory, AParentMustExistAndHaveTextures) {
     EXPECT_NE(lines[0].text.find(":\"---\")"), std::string::npos);
     EXPECT_NE(lines[1].text.find(":\"screen\")"), std::string::npos);
     EXPECT_EQ(CountOf(screen.Get()), 1);
+}
+
+TEST_F(Factory, WithoutAQueueWhatIsCallerSideIsNothing) {
+    auto const parent = NewBitmap(4, 4);
+    queue.RunAll();
+    IMKBitmap* const p = parent.Get();
+    using F = MKGraphicsFactory;
+    EXPECT_EQ(F::CreateBitmap(nullptr, p, 1), nullptr);
+    EXPECT_EQ(F::CreateScreenBitmap(nullptr, 0, 0, 1, 1, 1, 1), nullptr);
+    EXPECT_EQ(F::CreateCanvas(nullptr, p, 1), nullptr);
+    EXPECT_EQ(F::CreatePenCanvas(nullptr, p, 1), nullptr);
+    EXPECT_EQ(CountOf(p), 1);
+    OnRenderThread const here;
+    auto const empty =
+        BitmapPtr::Adopt(F::CreateBitmap(nullptr, reinterpret_cast<TextureObject const*>(this), 1));
+    auto const shared = BitmapPtr::Adopt(F::CreateBitmap(nullptr, p, 0));
+    auto const screen = BitmapPtr::Adopt(F::CreateScreenBitmap(nullptr, 0, 0, 1, 1, 1, 0));
+    for (IMKBitmap* const made : {empty.Get(), shared.Get(), screen.Get()}) {
+        ASSERT_NE(made, nullptr);
+        EXPECT_EQ(made->Clone(), nullptr) << "a clone is caller-side";
+    }
+    auto const canvas = RefPtr<IMKCanvasBase>::Adopt(F::CreateCanvas(nullptr, shared.Get(), 0));
+    auto const penCanvas = RefPtr<IMKCanvasBase>::Adopt(F::CreatePenCanvas(nullptr, shared.Get(), 0));
+    ASSERT_TRUE(canvas && penCanvas);
+    canvas->ClearAll(1, 0, 0, 1);
+    EXPECT_EQ(shared->GetPixel(Point(1, 1)), 0xFF0000FFu);
+    EXPECT_EQ(log.Count(ANDROID_LOG_ERROR), 0);
+    EXPECT_EQ(F::CreateBitmap(nullptr, static_cast<IMKBitmap*>(nullptr), 1), nullptr);
+    EXPECT_EQ(F::CreateBitmap(nullptr, screen.Get(), 1), nullptr);
+    EXPECT_EQ(log.Count(ANDROID_LOG_ERROR, "invalid parent bitmap"), 2) << "the parent is looked at first";
 }
 
 TEST_F(Factory, NullsAreIgnoredWhereTheyMayBe) {
@@ -125,7 +157,7 @@ TEST_F(Factory, AFileThatCannotBeReadIsNothingAndSaysWhy) {
     String const missing = Path("missing.mki");
     EXPECT_EQ(MKGraphicsFactory::CreateBitmap(&queue, &missing, 1), nullptr);
     EXPECT_EQ(MKGraphicsFactory::CreateBitmap(&queue, Rect(0, 0, 1, 1), &missing, 1), nullptr);
-    EXPECT_EQ(log.Count(ANDROID_LOG_ERROR, "missing.mki"), 2);
+    EXPECT_EQ(log.Count(ANDROID_LOG_ERROR, "/*******.mki': No such file"), 2);
     EXPECT_EQ(queue.GetPostedCount(), 0);
 }
 

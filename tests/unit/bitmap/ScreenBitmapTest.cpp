@@ -65,7 +65,6 @@ TEST_F(ScreenBitmap, StandsForTheFrameBufferAskedForAndClonesForTheOther) {
     EXPECT_EQ(CountOf(usual.Get()), 1);
     EXPECT_EQ(usual->GetBitmapReadable(), nullptr);
     EXPECT_EQ(usual->GetTextureBitmap(), nullptr);
-    EXPECT_EQ(MKGraphicsFactory::CreateScreenBitmap(nullptr, 0, 0, 1, 1, 1, 1), nullptr);
     constexpr int kMost = std::numeric_limits<int>::max(); // what lies beyond is cut to it
     constexpr int kLeast = std::numeric_limits<int>::min();
     EXPECT_EQ(NewScreen(kMost - 1, kLeast, 20, -2)->GetBitmapRect(), Rect(kMost - 1, kLeast, kMost, kLeast));
@@ -143,6 +142,17 @@ TEST_F(ScreenBitmap, ABlockIsReadUnturnedIntoItsPlaceInTheDestination) {
     EXPECT_EQ(read([&] { direct->GetBitmapData(asked, pixels.data()); }), expected);
 }
 
+TEST_F(ScreenBitmap, AThrowingCallbackCostsNoReference) {
+    auto const screen = NewScreen(0, 0, 4, 4);
+    queue.RunAll();
+    unsigned pixels[16];
+    screen->GetPixelAsync(Point(1, 1), nullptr, Thrown::OnPixel);
+    screen->GetBitmapDataAsync(Rect(0, 0, 4, 4), pixels, nullptr, Thrown::OnData);
+    EXPECT_THROW(queue.RunOne(), Thrown);
+    EXPECT_THROW(queue.RunOne(), Thrown);
+    EXPECT_EQ(CountOf(screen.Get()), 1);
+}
+
 TEST_F(ScreenBitmap, ActivationIsPostedDeactivationIsNotAndAttachingOnlyCounts) {
     auto const screen = NewScreen(0, 0, 20, 10);
     IMKBitmapWritable* const writable = screen->GetBitmapWritable();
@@ -176,6 +186,30 @@ TEST_F(ScreenBitmap, ActivationIsPostedDeactivationIsNotAndAttachingOnlyCounts) 
     std::vector<std::string> const calls = RecordingRenderer::TakeCalls();
     EXPECT_THAT(calls, Contains("target 1 Deactivate 0 1"));
     EXPECT_THAT(calls, Contains("target 2 Deactivate 1 0"));
+}
+
+template <class Screen>
+struct MyScreen : Screen {
+    using Screen::Screen;
+    void ActivateFrameBufferRT(bool release) override {
+        ++activations;
+        Screen::ActivateFrameBufferRT(release);
+    }
+    int activations = 0;
+};
+
+TEST_F(ScreenBitmap, ItsTasksReachTheOverridesOfADerivedClass) {
+    auto const posted = RefPtr<MyScreen<MKScreenBitmap>>::Adopt(
+        new MyScreen<MKScreenBitmap>(&queue, 0, 0, 4, 4, MKBitmap::DefaultFramebuffer));
+    posted->ActivateFrameBuffer();
+    queue.RunAll();
+    EXPECT_EQ(posted->activations, 1);
+    EXPECT_EQ(CountOf(posted.Get()), 1);
+    OnRenderThread const here;
+    auto const direct = RefPtr<MyScreen<MKScreenBitmapRT>>::Adopt(
+        new MyScreen<MKScreenBitmapRT>(&queue, 0, 0, 4, 4, MKBitmap::DefaultFramebuffer));
+    direct->ActivateFrameBuffer();
+    EXPECT_EQ(direct->activations, 1);
 }
 
 TEST_F(ScreenBitmap, AnUnknownTypeGivesOneErrorLineAndAnInertBitmap) {

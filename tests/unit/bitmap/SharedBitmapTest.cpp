@@ -1,13 +1,17 @@
 // Shared bitmaps: one image under several bitmaps, in whatever order they come and go.
+#include "moka/graphics/bitmap/MKSharedTextureBitmap.h"
 #include "moka/renderer/ITextureObject.h"
 #include "tests/unit/bitmap/BitmapFixture.h"
 
 #include <string>
+#include <type_traits>
 
 namespace Moka::Testing {
 namespace {
 
 using SharedBitmap = BitmapFixture;
+
+static_assert(!std::is_final_v<MKSharedTextureBitmap>);
 
 TEST_F(SharedBitmap, ACloneMadeBeforeAnythingRanShowsTheImage) {
     int const h = 2 * kMaxSide + 1;

@@ -49,6 +49,42 @@ TEST_F(SubBitmap, EveryPostedOperationHoldsOneReferenceUntilItRan) {
     EXPECT_EQ(get(TextureParamWrappingT), TextureWrapRepeat);
 }
 
+template <class Strip>
+struct MyStrip : Strip {
+    using Strip::Strip;
+    void AttachStencilBufferRT(bool release) override {
+        ++attachments;
+        Strip::AttachStencilBufferRT(release);
+    }
+    void SetTextureFilterRT(TextureParamFilteringValue value, bool release) override {
+        filter = value;
+        Strip::SetTextureFilterRT(value, release);
+    }
+    using Strip::SetTextureFilterRT;
+    int attachments = 0;
+    int filter = -1;
+};
+
+TEST_F(SubBitmap, ItsTasksReachTheOverridesOfADerivedClass) {
+    auto const posted = RefPtr<MyStrip<MKSubBitmap>>::Adopt(
+        new MyStrip<MKSubBitmap>(&queue, 0, Rect(0, 0, 4, 4), 4, 4, nullptr, false));
+    OnRenderThread const here;
+    auto const direct = RefPtr<MyStrip<MKSubBitmapRT>>::Adopt(
+        new MyStrip<MKSubBitmapRT>(&queue, 0, Rect(0, 0, 4, 4), 4, 4, nullptr, false));
+    auto const use = [](auto& strip) {
+        strip.AttachDepthBuffer();
+        strip.SetTextureFilter(TextureFilterNearest);
+    };
+    use(*posted);
+    use(*direct);
+    queue.RunAll();
+    RecordingRenderer::DeclareRenderThread();
+    EXPECT_EQ(posted->attachments + direct->attachments, 2);
+    EXPECT_EQ(posted->filter, TextureFilterNearest);
+    EXPECT_EQ(direct->filter, TextureFilterNearest);
+    EXPECT_EQ(CountOf(posted.Get()), 1);
+}
+
 TEST_F(SubBitmap, ARefusedPostKeepsTheReferenceAndDropsTheRequest) {
     auto strip = MakeStrip(&picky, Rect(0, 0, 4, 4));
     picky.RunAll();
@@ -144,6 +180,59 @@ TEST_F(SubBitmap, AsynchronousReadsCallBackEvenWhenThereIsNothingToRead) {
     EXPECT_EQ(untouched, Pixels(64, 9));
 }
 
+TEST_F(SubBitmap, AThrowingCallbackCostsNoReference) {
+    auto strip = MakeStrip(&queue, Rect(0, 0, 4, 4));
+    queue.RunAll();
+    Pixels pixels(64);
+    strip->GetPixelAsync(Point(1, 1), nullptr, Thrown::OnPixel);
+    strip->GetBitmapDataAsync(Rect(0, 0, 4, 4), pixels.data(), nullptr, Thrown::OnData);
+    EXPECT_THROW(queue.RunOne(), Thrown);
+    EXPECT_THROW(queue.RunOne(), Thrown);
+    EXPECT_EQ(CountOf(strip.Get()), 1);
+}
+
+[[gnu::noinline]] unsigned int GetPixelBelow(IMKSubBitmap& strip) {
+    unsigned char volatile above[512] = {};
+    return strip.GetPixel(Point(1, 1)) + above[0];
+}
+
+// Over the frames that have just returned.
+[[gnu::noinline]] bool IsUntouchedWhile(HandPumpedQueue& queue) {
+    unsigned char volatile frame[4096];
+    for (auto& byte : frame) byte = 0xAB;
+    queue.RunAll();
+    bool isUntouched = true;
+    for (auto const& byte : frame) isUntouched = isUntouched && byte == 0xAB;
+    return isUntouched;
+}
+
+TEST_F(SubBitmap, APixelThatIsReadTooLateHarmsNobody) {
+    Pixels const pixels = UniquePixels(4, 4);
+    auto strip = MakeStrip(&hasty, Rect(0, 0, 4, 4), &pixels);
+    hasty.RunAll();
+    EXPECT_EQ(GetPixelBelow(*strip), 0u);
+    EXPECT_TRUE(IsUntouchedWhile(hasty));
+    EXPECT_EQ(CountOf(strip.Get()), 1);
+    {
+        HastyQueue dropping; // with the read in it
+        auto lost = MakeStrip(&dropping, Rect(0, 0, 4, 4));
+        EXPECT_EQ(lost->GetPixel(Point(1, 1)), 0u);
+        for (int i = 0; i < 2; ++i) lost->Unref(); // what the dropped tasks leak
+    }
+}
+
+#if defined(MOKA_CHECKS) && MOKA_CHECKS
+TEST_F(SubBitmap, ABlockThatIsReadTooLateIsABrokenContract) {
+    auto strip = MakeStrip(&hasty, Rect(0, 0, 4, 4));
+    hasty.RunAll();
+    Pixels pixels(64);
+    EXPECT_DEATH(strip->GetBitmapData(Rect(0, 0, 4, 4), pixels.data()), "has not caught up");
+    auto screen = BitmapPtr::Adopt(MKGraphicsFactory::CreateScreenBitmap(&hasty, 0, 0, 4, 4, 1, 1));
+    hasty.RunAll();
+    EXPECT_DEATH(screen->GetBitmapData(Rect(0, 0, 4, 4), pixels.data()), "has not caught up");
+}
+#endif
+
 TEST_F(SubBitmap, ProjectionMapsItsRectangleWithRowZeroFirst) {
     Matrix4<float> const m = MakeStrip(&queue, Rect(10, 20, 50, 60))->GetProjectionMatrix();
     EXPECT_EQ(m, Matrix4<float>(0.05f, 0, 0, 0, 0, 0.05f, 0, 0, 0, 0, -1.0f / 32767, 0, -1.5f, -2, -0.0f, 1));
@@ -182,7 +271,7 @@ TEST_F(SubBitmap, TheRenderThreadFlavourDoesEverythingAtOnceAndCountsNothing) {
     strip->CreateFrameBuffer();
     strip->AttachDepthBuffer();
     strip->SetTag(std::string(200, 'y').c_str());
-    EXPECT_EQ(strip->GetTexture()->GetLabel(), std::string(126, 'y'));
+    EXPECT_EQ(strip->GetTexture()->GetLabel(), std::string(200, 'y')) << "only the caller-side tag is cut";
     Pixels const white(64, 255);
     strip->UpdateBitmap(Rect(0, 0, 2, 2), white.data(), 8);
     auto clone = RefPtr<IMKSubBitmap>::Adopt(strip->Clone());

@@ -163,6 +163,47 @@ TEST_F(Clipping, AStencilIsThereForOneDrawAndDrawnAnewForTheNext) {
     EXPECT_FALSE(unclipped.scissorOn || unclipped.depthStencil.IsStencil());
 }
 
+// Clears and what else the stencil is drawn with, each draw of it apart from the next.
+TEST_F(Clipping, StatesAndProgramAreThereBeforeTheFirstStencilClear) {
+    Clip(1, 1, 9, 9, Union);
+    Clip(1, 1, 9, 9, Union);
+    canvas->Clear(0, 0, 0, 1); // without a drawable of its own
+    queue.RunAll();
+    std::vector<std::string> steps;
+    for (RecordedCall const& call : RecordingRenderer::GetCalls()) {
+        if (call.operation == "ClearDepthStencil") break;
+        if (call.operation == "Apply" || call.operation == "MakeCurrent") steps.push_back(call.object);
+    }
+    EXPECT_THAT(steps, ElementsAre("blend 1", "depthstencil 1", "program 1"));
+}
+
+TEST_F(Clipping, TheShaderComesFirstAndTheClippingGoesBeforeTheDrawables) {
+    auto const take = [this](std::string const& operation) {
+        std::vector<std::string> kinds;
+        for (std::string const& call : TakeCalls(operation)) kinds.push_back(call.substr(0, call.find(' ')));
+        return kinds;
+    };
+    for (bool const draws : {false, true}) {
+        canvas = {};
+        queue.RunAll();
+        RecordingRenderer::TakeCalls();
+        canvas = NewCanvas(target);
+        EXPECT_THAT(take("Create"), ElementsAre("target", "program", "graphics", "graphics", "depthstencil",
+                                                "blend", "depthstencil"));
+        if (draws) canvas->DrawRect(1, 1, 9, 9, &paint);
+        queue.RunAll();
+        RecordingRenderer::TakeCalls();
+        canvas = {};
+        if (draws)
+            EXPECT_THAT(take("Release"),
+                        ElementsAre("graphics", "graphics", "depthstencil", "blend", "depthstencil",
+                                    "graphics", "blend", "depthstencil", "program", "target"));
+        else
+            EXPECT_THAT(take("Release"), ElementsAre("program", "graphics", "graphics", "depthstencil",
+                                                     "blend", "depthstencil", "target"));
+    }
+}
+
 TEST_F(Clipping, AClippedDrawLeavesTheScissorAsItWasAndAnUnclippedOneOff) {
     auto const setScissor = [](bool on) {
         OnRenderThread const here;

@@ -15,8 +15,8 @@ namespace {
 using ::testing::AllOf;
 using ::testing::Each;
 using ::testing::ElementsAre;
+using ::testing::EndsWith;
 using ::testing::HasSubstr;
-using ::testing::Not;
 using ::testing::SizeIs;
 
 struct Kind {
@@ -34,15 +34,14 @@ protected:
         EXPECT_EQ(::testing::internal::GetCapturedStderr(), "") << "a library wrote to stderr";
     }
 
-    // Either the file is refused with one line that names it, or it is an image and nothing is said.
+    // Either the file is refused with one line that masks its name, or it is an image and nothing is said.
     bool Refuses(Bytes const& file) {
         std::size_t const live = ArrayMemory::GetLive();
         bool const isNull = Decode(file, "some/folder/broken.img").pixels.empty();
         EXPECT_EQ(ArrayMemory::GetLive(), live) << "memory was kept";
         std::vector<std::string> const lines = errors.Take();
         EXPECT_EQ(lines.size(), isNull ? 1u : 0u) << ::testing::PrintToString(lines);
-        for (std::string const& line : lines)
-            EXPECT_THAT(line, AllOf(HasSubstr("'broken.img'"), Not(HasSubstr("folder"))));
+        for (std::string const& line : lines) EXPECT_THAT(line, HasSubstr("'****/******/******.img'"));
         return isNull;
     }
 
@@ -116,9 +115,8 @@ TEST_F(Malformed, ClaimsOutsideTheLimitsAreRefusedBeforeAnythingIsAllocated) {
         {MakePngHeader(0, 5), "IHDR"},
         {Replace(jpeg, frame + 5, {0xFF, 0xFF, 0xFF, 0xFF}), "65500"},
         {Replace(jpeg, frame + 5, {0xFF, 0x00, 0xFF, 0x00}), "1 GiB"},
-        {Replace(jpeg, frame + 5, {0, 0, 0, 8}), "'huge'"},
+        {Replace(jpeg, frame + 5, {0, 0, 0, 8}), "'****'"},
         {MakeWebpHeader({0, 0, 0, 0, 255, 255, 255, 0, 0, 0}), "above 65535"},
-        {MakeWebpHeader({2, 0, 0, 0, 9, 0, 0, 9, 0, 0}), "'huge': it is animated"},
     };
     for (auto const& one : cases) {
         ArrayMemory::ResetPeak();
@@ -143,12 +141,12 @@ TEST_F(Malformed, WhatIsNoImageFileIsRefusedByEveryReader) {
         std::string path;
         char const* reason;
     } const cases[] = {
-        {folder.Path("empty.png"), "'empty.png': the file is empty"},
-        {folder.Path("text.png"), "'text.png': it is no"},
-        {folder.Path("missing.png"), "'missing.png': No such file"},
+        {folder.Path("empty.png"), "/*****.png': the file is empty"},
+        {folder.Path("text.png"), "/****.png': it is no"},
+        {folder.Path("missing.png"), "/*******.png': No such file"},
         {folder.Path(""), "folder"},
-        {folder.Path("pipe.png"), "'pipe.png': it is not a regular file"},
-        {"/dev/zero", "'zero': it is not a regular file"},
+        {folder.Path("pipe.png"), "/****.png': it is not a regular file"},
+        {"/dev/zero", "'/***/****': it is not a regular file"},
         {folder.Path("text.png/below.png"), "Not a directory"},
         {folder.Path("large.png"), "2147483648 bytes"},
         {folder.Path("empty.png") + std::string("\0.png", 5), "zero byte"},
@@ -157,25 +155,28 @@ TEST_F(Malformed, WhatIsNoImageFileIsRefusedByEveryReader) {
     for (auto const& one : cases) {
         String const text(one.path);
         ImageInfo info;
-        EXPECT_EQ(BitmapFactory::CreateBitmapForGraphics(&text), nullptr);
-        EXPECT_EQ(BitmapFactory::CreateBitmap(&text, 4, 4), nullptr);
-        EXPECT_FALSE(BitmapFactory::GetImageInfo(&text, &info));
+        std::string reasons[3];
+        EXPECT_EQ(BitmapFactory::CreateBitmapForGraphics(&text, &reasons[0]), nullptr);
+        EXPECT_EQ(BitmapFactory::CreateBitmap(&text, 4, 4, &reasons[1]), nullptr);
+        EXPECT_FALSE(BitmapFactory::GetImageInfo(&text, &info, &reasons[2]));
         EXPECT_EQ(info.format, ImageFormat::Unknown);
-        EXPECT_THAT(errors.Take(), AllOf(SizeIs(3), Each(HasSubstr(one.reason))));
+        std::vector<std::string> const lines = errors.Take();
+        EXPECT_THAT(lines, AllOf(SizeIs(3), Each(HasSubstr(one.reason)), Each(EndsWith("': " + reasons[0]))));
+        EXPECT_THAT(reasons, Each(reasons[0]));
     }
     EXPECT_EQ(BitmapFactory::CreateBitmapForGraphics(nullptr), nullptr);
     EXPECT_EQ(BitmapFactory::CreateBitmapFromMemory(nullptr, 10, nullptr), nullptr);
     EXPECT_EQ(errors.Take().size(), 2u);
 }
 
-TEST_F(Malformed, FoldersAreNamedInEngineeringBuildsOnly) {
+TEST_F(Malformed, FilesAreNamedInEngineeringBuildsOnly) {
     String const text("/no-such-folder/in\nside.png");
     for (bool const isEngineering : {false, true}) {
         System::SetBuildTypeEngMode(isEngineering);
         EXPECT_EQ(BitmapFactory::CreateBitmapForGraphics(&text), nullptr);
         System::SetBuildTypeEngMode(false);
         EXPECT_THAT(errors.Take(), ElementsAre(HasSubstr(isEngineering ? "'/no-such-folder/in?side.png'"
-                                                                       : "'in?side.png'")));
+                                                                       : "'/**************/*******.png'")));
     }
 }
 

@@ -49,7 +49,6 @@ void WritePalette(png_structp png, png_infop info, PngKind const& kind, std::mt1
 
 // Chunks that must not change a pixel.
 void WriteNeedless(png_structp png, png_infop info) {
-    png_set_gAMA(png, info, 1.0);
     std::string key("Comment"), words(100000, 'x');
     png_text text = {};
     text.compression = PNG_TEXT_COMPRESSION_zTXt;

@@ -4,7 +4,6 @@
 #include "moka/graphics/bitmap/IMKTextureBitmap.h"
 #include "moka/graphics/bitmap/MKGraphicsFactory.h"
 #include "moka/graphics/drawable/MKBitmapDrawable.h"
-#include "moka/renderer/IDepthStencilState.h"
 #include "moka/renderer/IRenderTarget.h"
 #include "moka/renderer/ITextureObject.h"
 #include "tests/support/Queues.h"
@@ -116,7 +115,7 @@ TEST_F(BitmapDrawableTest, ABatchIsTheSameVerticesInOneDraw) {
 
 TEST_F(BitmapDrawableTest, TheDrawUsesThePaintAndTheBitmapAndLeavesTheStencilAlone) {
     MKPaint paint = CommonPaint();
-    ForceStencil();
+    ForceOtherStates();
     EXPECT_TRUE(Draw(RectF(0, 0, 5, 5), paint));
     EXPECT_TRUE(DrawBatch({RectF(0, 0, 5, 5)}, paint));
     std::vector<RecordedDraw> const draws = TakeDraws();
@@ -126,6 +125,29 @@ TEST_F(BitmapDrawableTest, TheDrawUsesThePaintAndTheBitmapAndLeavesTheStencilAlo
         EXPECT_TRUE(draw.state.depthStencil.IsStencil());
         EXPECT_EQ(draw.textures.at(0), "texture 1");
         EXPECT_EQ(Values(draw, {"uSrcTexture"}), "0");
+    }
+}
+
+TEST_F(BitmapDrawableTest, OnlyOneGpuGetsTheProgramThatClampsColors) {
+    for (std::string const gpu : {"Mali-T830", "Mali-T830 MP2", "Mali-T83"}) {
+        RecordingRenderer::SetGpuName(gpu);
+        drawable.reset();
+        RecordingRenderer::TakeCalls();
+        drawable.emplace(&queue);
+        char const* const program = gpu == "Mali-T830" ? "MKBitmapShaderColorClamp" : "MKBitmapShader";
+        std::vector<std::string> programs;
+        for (RecordedCall const& call : RecordingRenderer::GetCalls()) {
+            if (call.operation == "Create" && call.object.rfind("program", 0) == 0)
+                programs.push_back(call.arguments);
+        }
+        EXPECT_THAT(programs, ElementsAre(program, "MKBitmapAdvancedBlendingShader"));
+        ForceOtherStates();
+        EXPECT_TRUE(Draw(RectF(0, 0, 5, 5), CommonPaint()));
+        EXPECT_TRUE(DrawBatch({RectF(0, 0, 5, 5)}, CommonPaint()));
+        for (RecordedDraw const& draw : TakeDraws()) {
+            EXPECT_EQ(draw.shader, program);
+            ExpectCommonState(draw);
+        }
     }
 }
 
@@ -164,6 +186,28 @@ TEST_F(BitmapDrawableTest, DarkenAndLightenSampleACopyOfTheDestinationMadeOnceAS
     EXPECT_THAT(TakeTextureCalls(), ElementsAre("texture 2 Release", "texture 3 Create 101 50",
                                                 "texture 3 SetLabel " + tag + " 1",
                                                 "texture 3 CopyFromRenderTarget", "texture 3 Bind 1"));
+}
+
+TEST_F(BitmapDrawableTest, TheSizeOfTheDestinationIsSetBeforeTheTintsSwitch) {
+    MKPaint paint;
+    paint.SetXFermode(MKPaint::Darken);
+    Draw(RectF(0, 0, 5, 5), paint);
+    std::string values;
+    for (RecordedCall const& call : RecordingRenderer::GetCalls())
+        if (call.operation == "SetParameter" && call.object == "program 2")
+            values += call.arguments.substr(0, call.arguments.find(' ') + 1);
+    EXPECT_EQ(values, "uProjectionMatrix uColor uTintColor uDstTextureSize uHasTintColor uBlendingMode "
+                      "uSrcTexture uDstTexture ");
+}
+
+TEST_F(BitmapDrawableTest, ItReleasesGeometryStatesProgramsAndCopyInThatOrder) {
+    MKPaint paint;
+    paint.SetXFermode(MKPaint::Darken);
+    Draw(RectF(0, 0, 5, 5), paint);
+    RecordingRenderer::TakeCalls();
+    drawable.reset();
+    EXPECT_THAT(TakeObjects("Release"), ElementsAre("graphics 1", "blend 1", "depthstencil 1", "program 1",
+                                                    "program 2", "texture 2"));
 }
 
 TEST_F(BitmapDrawableTest, WithoutACopyOfTheDestinationNothingIsDrawn) {

@@ -4,7 +4,6 @@
 #include "moka/graphics/drawable/MKGaussianBlurDrawable.h"
 #include "moka/graphics/drawable/MKNonPremultipliedColorDrawable.h"
 #include "moka/graphics/drawable/MKTextMaskBitmapDrawable.h"
-#include "moka/renderer/IDepthStencilState.h"
 #include "tests/unit/bitmap/BitmapFixture.h"
 #include "tests/unit/drawable/DrawableFixture.h"
 
@@ -73,7 +72,7 @@ protected:
     // One draw, with the states and the tiling that all have in common.
     RecordedDraw Draw(IMKCustomDrawable& drawable) {
         OnRenderThread const here;
-        ForceStencil();
+        ForceOtherStates();
         RecordingRenderer::TakeEvents();
         drawable.DrawRT(projection, paint);
         std::vector<RecordedDraw> const draws = RecordingRenderer::GetDraws();

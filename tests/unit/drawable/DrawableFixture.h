@@ -2,6 +2,8 @@
 #pragma once
 
 #include "moka/graphics/canvas/MKPaint.h"
+#include "moka/renderer/IBlendStateObject.h"
+#include "moka/renderer/IDepthStencilState.h"
 #include "tests/unit/drawable/ShaderFixture.h"
 
 #include <cstddef>
@@ -43,8 +45,20 @@ inline MKPaint CommonPaint() {
     return paint;
 }
 
-// A stencil test, as a clip leaves it.
-inline void ForceStencil() {
+// The objects that were made, or released, since the calls were last taken, in their order.
+inline std::vector<std::string> TakeObjects(std::string const& operation) {
+    std::vector<std::string> objects;
+    for (RecordedCall const& call : RecordingRenderer::GetCalls())
+        if (call.operation == operation) objects.push_back(call.object);
+    RecordingRenderer::TakeCalls();
+    return objects;
+}
+
+// A stencil test, as a clip leaves it, and no blending.
+inline void ForceOtherStates() {
+    IBlendStateObject* const blend = RendererFactory::CreateBlendStateObject(BlendStateDescriptor(false));
+    blend->Apply();
+    blend->Release();
     DepthStencilStateDescriptor descriptor(false, true);
     descriptor.SetStencilFunction(StencilEqual, 1, 0xFF, 0);
     IDepthStencilState* const state = RendererFactory::CreateDepthStencilState(descriptor);

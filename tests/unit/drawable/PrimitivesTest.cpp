@@ -4,7 +4,6 @@
 #include "moka/graphics/drawable/MKLineDrawable.h"
 #include "moka/graphics/drawable/MKRectDrawable.h"
 #include "moka/graphics/drawable/MKRoundRectDrawable.h"
-#include "moka/renderer/IDepthStencilState.h"
 #include "tests/unit/base/Allocation.h"
 #include "tests/unit/drawable/DrawableFixture.h"
 
@@ -68,6 +67,8 @@ TEST_F(PrimitivesTest, StylesAndWidthsDecideWhatIsDrawn) {
     // Radii are clamped from above only.
     roundRect.DrawRoundRectRT(RectF(0, 0, 20, 10), 10.5f, -3, projection, MKPaint());
     EXPECT_EQ(Values(TakeDraws().at(1), {"uRxry"}), "10 -3");
+    roundRect.DrawRoundRectRT(RectF(0, 0, 20, 10), 3, 5.5f, projection, MKPaint());
+    EXPECT_EQ(Values(TakeDraws().at(1), {"uRxry"}), "3 5");
 }
 
 TEST_F(PrimitivesTest, DashesAreRunningSumsAndASolidLineLeavesThemAlone) {
@@ -108,14 +109,21 @@ TEST_F(PrimitivesTest, ThePointsAreFreedUnlessTheLineIsTooThin) {
 }
 
 struct Primitives {
+    // Each request on states that another one has left.
     void DrawAll(RectF const& r, float size, Matrix4<float> const& projection, MKPaint const& paint) {
         PointF const from(r.left, r.top);
         PointF const to(r.right, r.bottom);
+        ForceOtherStates();
         rect.DrawRectRT(r, projection, paint);
+        ForceOtherStates();
         roundRect.DrawRoundRectRT(r, size, size, projection, paint);
+        ForceOtherStates();
         circle.DrawCircleRT(from, size, projection, paint);
+        ForceOtherStates();
         line.DrawLineRT(from, to, projection, paint);
+        ForceOtherStates();
         line.DrawSimpleLineRT(from, to, projection, paint);
+        ForceOtherStates();
         if (!(paint.GetLineWidth() < 1)) // else it would stay ours
             line.DrawSimpleLinesRT(new std::vector<PointF>{from, to}, projection, paint);
     }
@@ -131,25 +139,49 @@ TEST_F(PrimitivesTest, EveryDrawAppliesThePaintAndItsOwnStates) {
     MKPaint paint = CommonPaint();
     paint.SetStyle(MKPaint::FillAndStroke);
     paint.SetLineWidth(2);
-    ForceStencil();
-    primitives.DrawAll(RectF(2, 2, 12, 12), 3, projection, paint);
-    std::vector<RecordedDraw> const draws = TakeDraws();
-    EXPECT_THAT(draws, SizeIs(1 + 4 + 2 + 3));
-    for (RecordedDraw const& draw : draws) {
-        ExpectCommonState(draw);
-        EXPECT_FALSE(draw.state.depthStencil.IsStencil() || draw.state.depthStencil.IsDepth());
+    auto const draw = [&] {
+        primitives.DrawAll(RectF(2, 2, 12, 12), 3, projection, paint);
+        std::vector<RecordedDraw> draws = TakeDraws();
+        EXPECT_THAT(draws, SizeIs(1 + 4 + 2 + 3));
+        return draws;
+    };
+    RecordingRenderer::TakeCalls();
+    std::vector<RecordedDraw> const draws = draw();
+    EXPECT_EQ(RecordingRenderer::CountCalls("SetDescriptor"), 1 + 1 + 1 + 3) << "equal ones as well";
+    for (RecordedDraw const& each : draws) {
+        ExpectCommonState(each);
+        EXPECT_FALSE(each.state.depthStencil.IsStencil() || each.state.depthStencil.IsDepth());
     }
     paint.ClearTintColor();
-    primitives.rect.DrawRectRT(RectF(2, 2, 12, 12), projection, paint);
-    EXPECT_EQ(Values(TakeDraw(), {"uHasTintColor"}), "0");
+    for (RecordedDraw const& each : draw()) EXPECT_EQ(Values(each, {"uHasTintColor"}), "0");
+    for (int mode : {-1, 19, 1000000}) { // any other number is source over
+        paint.SetXFermode(static_cast<MKPaint::XFermode>(mode));
+        for (RecordedDraw const& each : draw()) {
+            EXPECT_EQ(each.state.blend.GetColorEquation().destination, BlendingFactor::OneMinusSrcAlpha);
+        }
+    }
     paint.SetXFermode(MKPaint::BlendingOff);
     primitives.rect.DrawRectRT(RectF(2, 2, 12, 12), projection, paint);
     EXPECT_FALSE(TakeDraw().state.blend.IsBlending());
-    for (int mode : {-1, 19, 1000000}) { // any other number is source over
-        paint.SetXFermode(static_cast<MKPaint::XFermode>(mode));
-        primitives.rect.DrawRectRT(RectF(2, 2, 12, 12), projection, paint);
-        EXPECT_EQ(TakeDraw().state.blend.GetColorEquation().destination, BlendingFactor::OneMinusSrcAlpha);
-    }
+}
+
+template <class Drawable>
+std::string ObjectsOf() {
+    RecordingRenderer::TakeCalls();
+    auto drawable = std::make_unique<Drawable>();
+    std::vector<std::string> const made = TakeObjects("Create");
+    drawable.reset();
+    EXPECT_EQ(TakeObjects("Release"), made);
+    std::string kinds;
+    for (std::string const& object : made) kinds += object.substr(0, object.find(' ') + 1);
+    return kinds;
+}
+
+TEST_F(PrimitivesTest, GeometriesStatesAndProgramsAreMadeAndReleasedInThatOrder) {
+    EXPECT_EQ(ObjectsOf<MKRectDrawable>(), "graphics blend depthstencil program ");
+    EXPECT_EQ(ObjectsOf<MKCircleDrawable>(), "graphics blend depthstencil program ");
+    EXPECT_EQ(ObjectsOf<MKLineDrawable>(), "graphics graphics blend depthstencil program program ");
+    EXPECT_EQ(ObjectsOf<MKRoundRectDrawable>(), "graphics graphics blend depthstencil program program ");
 }
 
 TEST_F(PrimitivesTest, NumbersThatAreNoneDoNoHarm) {

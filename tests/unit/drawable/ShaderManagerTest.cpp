@@ -1,8 +1,10 @@
 #include "moka/graphics/drawable/ShaderExceptions.h"
+#include "tests/unit/base/Allocation.h"
 #include "tests/unit/drawable/ShaderFixture.h"
 
 #include <atomic>
 #include <chrono>
+#include <cstdlib>
 #include <new>
 #include <thread>
 
@@ -139,6 +141,43 @@ TEST_F(ShaderManagerTest, WithoutMemoryTheEntryIsThereAndTheShaderIsNull) {
     EXPECT_EQ(manager.GetShader<NoMemoryShader>(), nullptr);
     EXPECT_THAT(log.GetTexts(), IsEmpty());
     manager.RemoveShader(ShaderManager::Key(typeid(NoMemoryShader).name()));
+}
+
+// Has memory of its own, so that only the manager runs out of it.
+struct FrugalShader {
+    FrugalShader() { ++alive; }
+    ~FrugalShader() { --alive; }
+    static void* operator new(std::size_t size, std::nothrow_t const&) noexcept { return std::malloc(size); }
+    static void operator delete(void* memory) { std::free(memory); }
+    static inline int alive = 0;
+};
+
+TEST_F(ShaderManagerTest, WithoutMemoryForTheEntryThereIsNeitherItNorAShader) {
+    FrugalShader* shader = nullptr;
+    EXPECT_NO_THROW({
+        FailAllocations const noMemory;
+        shader = manager.GetShader<FrugalShader>();
+    });
+    EXPECT_EQ(shader, nullptr);
+    EXPECT_EQ(FrugalShader::alive, 0);
+    shader = manager.GetShader<FrugalShader>();
+    EXPECT_NE(shader, nullptr);
+    manager.ReleaseShader(shader);
+    EXPECT_EQ(FrugalShader::alive, 0);
+}
+
+TEST_F(ShaderManagerTest, AMistakeIsToldInNoMemoryAsWell) {
+    std::string told;
+    told.reserve(100);
+    EXPECT_NO_THROW({
+        FailAllocations const noMemory;
+        try {
+            ParameterBinding<BindingTypeInt>() = 1;
+        } catch (NotSupportedException const& error) {
+            told = error.what();
+        }
+    });
+    EXPECT_EQ(told, "ParameterBinding: internal interface is not initialized!");
 }
 
 struct SlowShader {

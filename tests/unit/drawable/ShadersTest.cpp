@@ -3,6 +3,9 @@
 #include "moka/graphics/drawable/ShaderExceptions.h"
 #include "tests/unit/drawable/ShaderFixture.h"
 
+#include <filesystem>
+#include <fstream>
+
 namespace Moka::Testing {
 
 #define EVERY_KIND_UNIFORMS(U)                                                                               \
@@ -87,6 +90,24 @@ TEST_F(ShadersTest, AssigningToWhatWasNeverBoundOrFailedToBindThrows) {
     }
     EXPECT_EQ(RecordingRenderer::CountCalls("SetParameter"), 0);
     EXPECT_EQ(RecordingRenderer::CountCalls("ReleaseParameter"), 2);
+}
+
+// Where a mediump float has 16 bits a place above 1024 is known to a whole unit, and a wide bitmap skips texels.
+TEST(ShaderPrecision, WhatIsInterpolatedIsOfHighPrecisionInEveryFragmentStage) {
+    int varyings = 0;
+    for (auto const& entry : std::filesystem::directory_iterator(MOKA_SHADER_FOLDER)) {
+        if (entry.path().extension() != ".frag") continue;
+        std::ifstream file(entry.path());
+        bool isDefault = false;
+        for (std::string line; std::getline(file, line);) {
+            isDefault = isDefault || line == "precision highp float;";
+            if (line.rfind("varying ", 0) != 0 && line.rfind("in ", 0) != 0) continue;
+            ++varyings;
+            EXPECT_TRUE(isDefault || line.find(" highp ") != std::string::npos)
+                << entry.path() << ": " << line;
+        }
+    }
+    EXPECT_EQ(varyings, 15);
 }
 
 } // namespace

@@ -184,6 +184,7 @@ TEST_F(SaveManager, WithoutAMessageLoopResultsComeToThoseWhoWait) {
         manager.WaitForSaveCompleting(nullptr);
         EXPECT_EQ(results, Events{"saved a.png"});
     }).join();
+    EXPECT_EQ(log.Count(ANDROID_LOG_ERROR), 0);
 }
 
 } // namespace

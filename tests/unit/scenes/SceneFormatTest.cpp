@@ -4,6 +4,7 @@
 #include "scenes/SceneFile.h"
 #include "scenes/SceneText.h"
 #include "tests/support/LogCapture.h"
+#include "tests/support/TestFiles.h"
 #include "tests/unit/scenes/CanvasLog.h"
 
 #include <gmock/gmock.h>
@@ -145,74 +146,88 @@ TEST(SceneFormat, SizeAndBackgroundAreTheScenes) {
 }
 
 struct Mistake {
-    char const* text;
-    int line;
-    char const* part;
+    std::string text;
+    char const* start; // of the message, behind the file's name
 };
 
-void ExpectNamed(Mistake const& mistake, std::string const& error) {
-    EXPECT_THAT(error, StartsWith("bad.json:" + std::to_string(mistake.line) + ": ")) << mistake.text;
-    EXPECT_THAT(error, HasSubstr(mistake.part)) << mistake.text;
-}
-
-TEST(SceneFormat, AMistakeInTheFileIsNamedWithItsLine) {
-    Mistake const mistakes[] = {
-        {"", 1, "unexpected end of input"},
-        {"{\n\"size\": [8, 6],\n}", 3, "object key"},
-        {"{\"a\n\": 1}", 1, "control character"},
-        {"{\"size\": [8, 6], \"about\": \"\xFF\"}", 1, "UTF-8"},
-        {"{\n\"size\": [8, 1e999]}", 2, "number overflow"},
-        {"{\n\n\"size\": [8, 1e39]}", 3, "too large"},
-        {"{\"size\": [8, 6],\n\"size\": [8, 6]}", 2, "\"size\" is given twice"},
-        {"{\n}", 1, "a scene needs \"size\""},
-        {"{\"size\": 8}", 1, "size must be [width, height], not 8"},
-        {"{\"size\": [8,\n0]}", 2, "size: height must be a whole number from 1 to 16384, not 0"},
-        {"{\"size\": [16385, 1]}", 1, "from 1 to 16384, not 16385"},
-        {"{\"size\": [8, 6], \"operations\": {}}", 1, "operations must be a list of operations"},
-        {"{\"size\": [8, 6], \"operations\": [],\n\"backgroud\": 1}", 2, "not \"backgroud\""},
-        {"{\"size\": [8, 6],\n\"background\": \"#12345\"}", 2, "background must be \"#RRGGBB\""},
-        {"{\"size\": [8, 6],\n\"bitmaps\": {\n\"a\": {\"picture\": \"cat\", \"width\": 1, \"height\": 1}}}",
-         3, "picture must be one of gradient, checker"},
-        {"{\"size\": [8, 6],\n\"bitmaps\": {\"a\": {\"picture\": \"photo\",\n\"width\": 1,\n\"height\": "
-         "5000}}}",
-         4, "height must be a whole number from 1 to 4096"},
-        {"{\"size\": [8, 6],\n\"bitmaps\": {\n\"a\": {\n\"file\": \"cat.png\"}}}", 4, "/nowhere/cat.png"},
-        {"{\"size\": [8, 6],\n\"paints\": {\"a\": {\"base\": \"b\"}}}", 2, "base must be described under"},
-    };
+void ExpectNamed(std::vector<Mistake> const& mistakes) {
     LogCapture const log;
-    for (Mistake const& mistake : mistakes) ExpectNamed(mistake, FindError(mistake.text));
+    for (Mistake const& mistake : mistakes)
+        EXPECT_THAT(FindError(mistake.text), StartsWith(std::string("bad.json:") + mistake.start))
+            << mistake.text;
 }
 
-TEST(SceneFormat, AMistakeInAnOperationIsNamedWithItsLine) {
-    Mistake const mistakes[] = {
-        {"{\"DrawCircle\": {\"cx\": 1, \"cy\": 2}}", 4, "DrawCircle needs \"radius\""},
-        {"{\"DrawCircle\": {\"cx\": 1,\n\"cy\": 2, \"radius\":\n\"big\"}}", 6,
-         "DrawCircle: radius must be a number, not \"big\""},
-        {"{\"Save\": {}},\n{\"DrawCircle\": {\"cx\": 1, \"cy\": 2, \"radius\": 3,\n\"raduis\": 3}}", 6,
-         "DrawCircle knows cx, cy, radius, paint; not \"raduis\""},
-        {"{\"Save\": {}},\n\n{\"DrawCircel\": {}}", 6,
-         "no operation \"DrawCircel\"; there are Group, DrawBitmap"},
-        {"{\"Save\": {}, \"Restore\": {}}", 4, "an operation must be an object with one name"},
-        {"{\"Save\": 3}", 4, "Save must be an object"},
-        {"{\"Save\": {\"flag\": \"SaveSome\"}}", 4, "one of SaveAll, SaveMatrix, SaveClip or its number"},
-        {"{\"DrawRect\": {\"rect\": [1, 2, 3]}}", 4, "[left, top, right, bottom], not a list of 3"},
-        {"{\"DrawRect\": {\"rect\": [1, 2,\n3, null]}}", 5, "rect[3] must be a number, not null"},
-        {"{\"DrawRect\": {\"rect\": [1, 2, 3, 4],\n\"paint\": \"ink\"}}", 5, "described under \"paints\""},
-        {"{\"DrawRect\": {\"rect\": [1, 2, 3, 4],\n\"paint\": {\"xfermode\": \"Multiply\"}}}", 5,
-         "one of Add, Clear"},
-        {"{\"DrawRect\": {\"rect\": [1, 2, 3, 4],\n\"paint\": {\"antiAliasing\": 1}}}", 5,
-         "true or false, not 1"},
-        {"{\"DrawBitmap\": {\"bitmap\": \"a\", \"x\": 1, \"y\": 2}}", 4, "described under \"bitmaps\""},
-        {"{\"DrawSimpleLines\": {\"points\": [[1, 2]]}}", 4, "even number of points"},
-        {"{\"SetClipRect\": {\"x\": 0.5, \"y\": 1, \"width\": 2, \"height\": 3}}", 4,
-         "whole number, not 0.5"},
-        {"{\"SetMatrix\": {\"matrix\": [1, 0, 0, 1, 0, 0]}}", 4, "nine numbers, column by column"},
-        {"{\"Group\": {\"clip\": [0, 0, 1.5, 1], \"operations\": []}}", 4, "whole number"},
-        {"{\"Group\": {\"repeat\": {\"count\": 0}, \"operations\": []}}", 4, "from 1 to 100000, not 0"},
-        {"{\"Group\": {\"operations\": [\n{\"Group\": {\"operations\": [\n{\"Draw\": {}}]}}]}}", 6,
-         "\"Draw\""},
+TEST(SceneFormat, AMistakeInTheFileIsNamedWithItsPlace) {
+    ExpectNamed({
+        {"", "1:1: this is no JSON: syntax error"},
+        {"{\n\"size\": [8, 6],\n}", "3:1: this is no JSON: syntax error"},
+        {"{\"a\n\": 1}", "1:4: this is no JSON: syntax error"},
+        {"{\"size\": [8, 6], \"about\": \"\xFF\"}", "1:28: this is no JSON: syntax error"},
+        {"{\n\"size\": [8, 1e999]}", "2:13: this is no JSON: number overflow"},
+        {"{\n\n\"size\": [8, 1e39]}", "3:13: a number is too large"},
+        {"{\"size\": [8, 6],\n  \"size\": [8, 6]}", "2:3: \"size\" is given twice"},
+        {"{\n}", "1:1: the scene needs \"size\""},
+        {"{\"size\": 8}", "1:10: size must be [width, height], not 8"},
+        {"{\"size\": [8,\n0]}", "2:1: size[1] must be a whole number from 1 to 16384, not 0"},
+        {"{\"size\": [16385, 1]}", "1:11: size[0] must be a whole number from 1 to 16384, not 16385"},
+        {"{\"size\": [8, 6], \"operations\": {}}", "1:32: operations must be a list of operations"},
+        {"{\"size\": [8, 6], \"operations\": [],\n\"backgroud\": 1}",
+         "2:14: backgroud is unknown; there are size, about, background, bitmaps, paints, operations"},
+        // A column counts characters, and what is in a text is no structure.
+        {"{\"about\": \"\u00e9\\\\\\\"{[,\", \"size\": true}", "1:31: size must be"},
+        {"{\"size\": [8, 6],\n\"background\": \"#12345\"}", "2:15: background must be \"#RRGGBB\""},
+        {"{\"size\": [8, 6],\n\"bitmaps\": {\n\"a\": {\"picture\": \"cat\", \"width\": 1, \"height\": 1}}}",
+         "3:18: bitmaps.a.picture must be one of gradient, checker"},
+        {"{\"size\": [8, 6],\n\"bitmaps\": {\"a b\": {\"picture\": \"photo\",\n\"width\": 1,\n\"height\": "
+         "5000}}}",
+         "4:11: bitmaps[\"a b\"].height must be a whole number from 1 to 4096"},
+        {"{\"size\": [8, 6],\n\"bitmaps\": {\n\"a\": {\n\"file\": \"cat.png\"}}}",
+         "4:9: bitmaps.a.file: cannot load the image /nowhere/cat.png"},
+        {"{\"size\": [8, 6],\n\"paints\": {\"a\": {\"base\": \"b\"}}}",
+         "2:26: paints.a.base must be described under"},
+    });
+}
+
+TEST(SceneFormat, AMistakeInAnOperationIsNamedWithItsPlace) {
+    std::vector<Mistake> mistakes = {
+        {R"({"DrawCircle": {"cx": 1, "cy": 2}})", "4:16: operations[0].DrawCircle needs \"radius\""},
+        {"{\"DrawCircle\": {\"cx\": 1,\n\"cy\": 2, \"radius\":\n\"big\"}}",
+         "6:1: operations[0].DrawCircle.radius must be a number, not \"big\""},
+        {"{\"Save\": {}},\n{\"DrawCircle\": {\"cx\": 1, \"cy\": 2, \"radius\": 3,\n\"raduis\": 3}}",
+         "6:11: operations[1].DrawCircle.raduis is unknown; there are cx, cy, radius, paint"},
+        {"{\"Save\": {}},\n\n{\"DrawCircel\": {}}",
+         "6:16: operations[1].DrawCircel is no operation; there are Group, DrawBitmap"},
+        {R"({"Save": {}, "Restore": {}})", "4:1: operations[0] must be an object with one name"},
+        {R"({"Save": 3})", "4:10: operations[0].Save must be an object"},
+        {R"({"Save": {"flag": "SaveSome"}})",
+         "4:19: operations[0].Save.flag must be one of SaveAll, SaveMatrix, SaveClip or its number"},
+        {R"({"DrawRect": {"rect": [1, 2, 3]}})",
+         "4:23: operations[0].DrawRect.rect must be [left, top, right, bottom], not a list of 3"},
+        {"{\"DrawRect\": {\"rect\": [1, 2,\n3, null]}}",
+         "5:4: operations[0].DrawRect.rect[3] must be a number, not null"},
+        {"{\"DrawRect\": {\"rect\": [1, 2, 3, 4],\n\"paint\": \"ink\"}}",
+         "5:10: operations[0].DrawRect.paint must be described under \"paints\""},
+        {"{\"DrawRect\": {\"rect\": [1, 2, 3, 4],\n\"paint\": {\"xfermode\": \"Multiply\"}}}",
+         "5:23: operations[0].DrawRect.paint.xfermode must be one of Add, Clear"},
+        {"{\"DrawRect\": {\"rect\": [1, 2, 3, 4],\n\"paint\": {\"antiAliasing\": 1}}}",
+         "5:27: operations[0].DrawRect.paint.antiAliasing must be true or false, not 1"},
+        {R"({"DrawBitmap": {"bitmap": "a", "x": 1, "y": 2}})",
+         "4:27: operations[0].DrawBitmap.bitmap must be described under \"bitmaps\""},
+        {R"({"DrawSimpleLines": {"points": [[1, 2]]}})",
+         "4:32: operations[0].DrawSimpleLines.points must be an even number of points"},
+        {R"({"SetClipRect": {"x": 0.5, "y": 1, "width": 2, "height": 3}})",
+         "4:23: operations[0].SetClipRect.x must be a whole number, not 0.5"},
+        {R"({"SetMatrix": {"matrix": [1, 0, 0, 1, 0, 0]}})",
+         "4:26: operations[0].SetMatrix.matrix must be nine numbers, column by column"},
+        {R"({"Group": {"clip": [0, 0, 1.5, 1], "operations": []}})",
+         "4:27: operations[0].Group.clip[2] must be a whole number"},
+        {R"({"Group": {"repeat": {"count": 0}, "operations": []}})",
+         "4:32: operations[0].Group.repeat.count must be a whole number from 1 to 100000, not 0"},
+        {"{\"Group\": {\"operations\": [\n{\"Group\": {\"operations\": [\n{\"Draw\": {}}]}}]}}",
+         "6:10: operations[0].Group.operations[0].Group.operations[0].Draw is no operation"},
     };
-    for (Mistake const& mistake : mistakes) ExpectNamed(mistake, FindError(WithOperations(mistake.text)));
+    for (Mistake& mistake : mistakes) mistake.text = WithOperations(mistake.text);
+    ExpectNamed(mistakes);
 }
 
 // So that a file of a few bytes cannot keep anybody busy.
@@ -222,7 +237,7 @@ TEST(SceneFormat, RepetitionsNestingAndBatchesHaveLimits) {
     EXPECT_EQ(FindError(WithOperations(thousand + thousand + "{\"Save\": {}}" + end + end)), "no error");
     EXPECT_THAT(
         FindError(WithOperations(thousand + thousand + "{\"Save\": {}},\n{\"Save\": {}}" + end + end)),
-        StartsWith("bad.json:4: a scene may have 1000000 operations"));
+        StartsWith("bad.json:4:1: operations[0]: a scene may have 1000000 operations"));
     // Even where there is nothing to repeat.
     EXPECT_THAT(FindError(WithOperations(thousand + thousand + thousand + end + end + end)),
                 HasSubstr("1000000 operations"));
@@ -232,6 +247,23 @@ TEST(SceneFormat, RepetitionsNestingAndBatchesHaveLimits) {
         HasSubstr("more than 1000000 places"));
     std::string const deep = std::string(100'000, '[') + std::string(100'000, ']');
     EXPECT_THAT(FindError(deep), HasSubstr("nested more than 64 levels"));
+}
+
+// The limit is one for all of a scene, whether made by rule or read from a file.
+TEST(SceneFormat, BitmapsAreCountedBeforeTheirPixelsAreMade) {
+    auto const with = [](int count, std::string const& last) {
+        std::string text = "{\"size\": [8, 6], \"operations\": [],\n\"bitmaps\": {";
+        for (int i = 0; i < count; ++i)
+            text += '"' + std::to_string(i) + R"(": {"picture": "disc", "width": 4096, "height": 4096},)";
+        return text + "\n\"last\": " + last + "}}";
+    };
+    char const* const expected =
+        "bad.json:3:9: bitmaps.last: all bitmaps of a scene together may have 67108864 pixels";
+    EXPECT_THAT(FindError(with(64, "0")), HasSubstr("may have 64 bitmaps"));
+    EXPECT_EQ(FindError(with(4, R"({"picture": "disc", "width": 1, "height": 1})")), expected);
+    TempFolder const folder;
+    ASSERT_TRUE(SaveImage(MakeGradient(2, 2), folder.Path("a.png")));
+    EXPECT_EQ(FindError(with(4, "{\"file\": \"" + folder.Path("a.png") + "\"}")), expected);
 }
 
 TEST(SceneFormat, ABitmapThatCannotBeMadeDrawsNothing) {

@@ -74,7 +74,7 @@ TEST(SceneRegistry, NothingTheLibraryKnowsIsLeftOut) {
     RefPtr<CanvasLog> const clips = PlayScene(*Scenes::FindScene("clips"));
     for (int op = 0; op <= 5; ++op)
         EXPECT_GE(clips->Count("SetClipRect 26 24 60 56 " + std::to_string(op)), 2) << op;
-    EXPECT_TRUE(PlayScene(*Scenes::FindScene("bitmap-batch"))->Contains("DrawBitmaps 7x7 1000:"));
+    EXPECT_TRUE(PlayScene(*Scenes::FindScene("bitmap-batch"))->Contains("DrawBitmaps 5x5 1000:"));
     RefPtr<CanvasLog> const tiles = PlayScene(*Scenes::FindScene("bitmap-tiles"));
     for (char const* const tile : {"tile1,1", "tile2,1", "tile3,1", "tile1,2", "tile2,2", "tile3,3"})
         EXPECT_TRUE(tiles->Contains(tile)) << tile;

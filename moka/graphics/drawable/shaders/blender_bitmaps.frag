@@ -9,8 +9,8 @@ uniform vec4 uColor;
 uniform vec4 uTintColor;
 uniform int uHasTintColor;
 
-varying float alphaAA;
-varying vec2 vUV;
+varying highp float alphaAA;
+varying highp vec2 vUV; // 16 bits cannot tell the texels of a wide bitmap apart
 
 void main() {
     gl_FragColor = mix(texture2D(uSrcTexture1, vUV), texture2D(uSrcTexture2, vUV), uFactor);

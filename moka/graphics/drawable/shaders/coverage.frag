@@ -5,7 +5,7 @@ uniform vec4 uColor;
 uniform vec4 uTintColor;
 uniform int uHasTintColor;
 
-varying float alphaAA;
+varying highp float alphaAA;
 
 void main() {
     float alpha = alphaAA * uColor.a;

@@ -4,41 +4,43 @@ precision mediump float;
 uniform vec4 uColor;
 uniform vec4 uTintColor;
 uniform int uHasTintColor;
-uniform vec2 uLineInfo; // half the width, the length
+// Positions, lengths and distances are highp: a mediump float may have 16 bits, which overflow when a distance
+// above 256 is squared.
+uniform highp vec2 uLineInfo; // half the width, the length
 uniform int uIsDashedLine;
-uniform vec4 uDashedLinePattern; // where dash, gap, dash, gap end
-uniform float uDashedLinePatternLength;
+uniform highp vec4 uDashedLinePattern; // where dash, gap, dash, gap end
+uniform highp float uDashedLinePatternLength;
 uniform int uLineCapType; // 0 butt, 1 round, else square
 
-varying vec2 vLineCoord;
+varying highp vec2 vLineCoord;
 
 // An edge that does not exist on its side.
-const float kNowhere = 100000.0;
+const highp float kNowhere = 100000.0;
 
 // Whether x lies in [low, high].
-bool within(float x, float low, float high) {
+bool within(highp float x, highp float low, highp float high) {
     return low <= x && x <= high;
 }
 
 // A stretch along the line: a dash, when inside, or what lies between the end of one and the begin of the
 // next.
 struct Stretch {
-    float x; // where in it the fragment lies; of a dashed line the place in the pattern
-    float left;
-    float right;
+    highp float x; // where in it the fragment lies; of a dashed line the place in the pattern
+    highp float left;
+    highp float right;
     bool inside;
 };
 
-Stretch solid(float x, float lineLength) {
+Stretch solid(highp float x, highp float lineLength) {
     if (x < 0.0) return Stretch(x, -kNowhere, 0.0, false);
     if (x > lineLength) return Stretch(x, lineLength, kNowhere, false);
     return Stretch(x, 0.0, lineLength, true);
 }
 
-Stretch dashed(float x, float halfWidth, float lineLength) {
-    vec4 p = uDashedLinePattern;
-    float rest = mod(lineLength, uDashedLinePatternLength); // where in the pattern the line ends
-    float cx = mod(x, uDashedLinePatternLength);
+Stretch dashed(highp float x, highp float halfWidth, highp float lineLength) {
+    highp vec4 p = uDashedLinePattern;
+    highp float rest = mod(lineLength, uDashedLinePatternLength); // where in the pattern the line ends
+    highp float cx = mod(x, uDashedLinePatternLength);
     if (x >= lineLength) {
         if (within(rest, 0.0, p.x) || within(rest, p.y, p.z)) return Stretch(x, lineLength, kNowhere, false);
         return Stretch(cx, rest < p.y ? p.x : p.z, kNowhere, false);
@@ -65,7 +67,7 @@ float alongInside(Stretch s) {
 }
 
 // The caps of the dashes on both sides.
-float alongOutside(Stretch s, float y, float halfWidth) {
+float alongOutside(Stretch s, highp float y, highp float halfWidth) {
     float left;
     float right;
     if (uLineCapType == 0) {
@@ -81,16 +83,16 @@ float alongOutside(Stretch s, float y, float halfWidth) {
     return max(left, right);
 }
 
-float across(float y, float halfWidth) {
+float across(highp float y, highp float halfWidth) {
     if (y > halfWidth - 0.5) return clamp(0.5 + halfWidth - y, 0.0, 1.0);
     if (y < -halfWidth + 0.5) return clamp(0.5 + halfWidth + y, 0.0, 1.0);
     return 1.0;
 }
 
 void main() {
-    float y = vLineCoord.y;
-    float halfWidth = uLineInfo.x;
-    float lineLength = uLineInfo.y;
+    highp float y = vLineCoord.y;
+    highp float halfWidth = uLineInfo.x;
+    highp float lineLength = uLineInfo.y;
     Stretch s;
     if (uIsDashedLine == 1) {
         s = dashed(vLineCoord.x, halfWidth, lineLength);

@@ -1,0 +1,139 @@
+// What is drawn onto a bitmap that has no frame buffer goes nowhere, and not into the host's window.
+#include "moka/base/RefPtr.h"
+#include "moka/base/log/AndroidLog.h"
+#include "moka/graphics/bitmap/IMKBitmap.h"
+#include "moka/graphics/bitmap/IMKSubBitmap.h"
+#include "moka/graphics/bitmap/IMKTextureBitmap.h"
+#include "moka/graphics/bitmap/MKGraphicsFactory.h"
+#include "moka/graphics/drawable/MKNonPremultipliedColorDrawable.h"
+#include "moka/host/RenderThread.h"
+#include "moka/renderer/IRenderTarget.h"
+#include "moka/renderer/RendererFactory.h"
+#include "tests/support/ImageCompare.h"
+#include "tests/support/LogCapture.h"
+#include "tests/support/NothingLeft.h"
+#include "tests/support/TestImages.h"
+#include "tests/unit/canvas/EveryOperation.h"
+
+#include <gtest/gtest.h>
+
+#include <functional>
+#include <memory>
+#include <string>
+
+namespace Moka::Testing {
+namespace {
+
+using BitmapPtr = RefPtr<IMKBitmap>;
+using CanvasPtr = RefPtr<IMKCanvas>;
+constexpr int kSide = 64; // of the window, and the most that a texture may have
+constexpr Color kWindow{51, 102, 153, 255};
+
+// Hands tasks on to the render thread, but for the ordinal-th from now.
+class PickyQueue final : public IGLMsgQueue {
+public:
+    explicit PickyQueue(IGLMsgQueue& real) : mReal(real) {}
+    void Refuse(int ordinal) { mLeft = ordinal; }
+    bool Post(ITask* task) override { return --mLeft != 0 && mReal.Post(task); }
+    void WaitForTasks() override { mReal.WaitForTasks(); }
+
+private:
+    IGLMsgQueue& mReal;
+    int mLeft = 0;
+};
+
+class NoFrameBuffer : public ::testing::Test {
+protected:
+    void SetUp() override {
+        RenderThreadOptions options;
+        options.limits.maxTextureSize = kSide;
+        options.debugContext = true;
+        options.surfaceWidth = options.surfaceHeight = kSide;
+        std::string error;
+        thread = RenderThread::Start(options, &error);
+        ASSERT_TRUE(thread) << error;
+        queue = std::make_unique<PickyQueue>(*thread);
+        thread->Call([this] {
+            window = RendererFactory::CreateRenderTargetFromDefault(kSide, kSide);
+            window->ClearColor(0.2f, 0.4f, 0.6f, 1);
+        });
+        TestImage const white = MakeChecker(8, 8, 1, {255, 255, 255, 255}, {255, 255, 255, 255});
+        source = Create(8, 8, white.pixels.data());
+        custom =
+            RefPtr<MKNonPremultipliedColorDrawable>::Adopt(new MKNonPremultipliedColorDrawable(queue.get()));
+        custom->SetBitmap(source.Get(), source.Get());
+        thread->WaitForTasks(); // the image may go
+    }
+
+    void TearDown() override {
+        custom = {};
+        source = {};
+        thread->Call([this] { window->Release(); });
+        thread->WaitForTasks(); // what goes last posts the end of what it held
+        ExpectNothingLeft(RendererFactory::GetStatistics());
+        thread.reset();
+        for (std::string const& line : log.GetTexts(ANDROID_LOG_ERROR)) ADD_FAILURE() << line;
+    }
+
+    BitmapPtr Create(int width, int height, void const* pixels = nullptr) {
+        return BitmapPtr::Adopt(
+            MKGraphicsFactory::CreateBitmap(queue.get(), width, height, pixels, false, 1, false));
+    }
+    CanvasPtr NewCanvas(BitmapPtr const& bitmap, int useQueue = 1) {
+        return CanvasPtr::Adopt(MKGraphicsFactory::CreateCanvas(queue.get(), bitmap.Get(), useQueue));
+    }
+
+    TestImage ReadWindow() {
+        TestImage image(kSide, kSide);
+        thread->Call([&] { window->ReadPixels(0, 0, kSide, kSide, {image.pixels.data(), kSide, 0, 0}); });
+        return image;
+    }
+
+    void ExpectWindowUntouched(char const* what) {
+        TestImage const expected = MakeChecker(kSide, kSide, 1, kWindow, kWindow);
+        EXPECT_EQ(CompareImages(expected, ReadWindow()).differingPixels, 0) << what;
+    }
+
+    LogCapture log;
+    std::unique_ptr<RenderThread> thread;
+    std::unique_ptr<PickyQueue> queue;
+    IRenderTarget* window = nullptr;
+    BitmapPtr source;
+    RefPtr<MKNonPremultipliedColorDrawable> custom;
+};
+
+TEST_F(NoFrameBuffer, OfABitmapThatIsTooWideNothingIsDrawnAndOneErrorTellsOfIt) {
+    BitmapPtr const bitmap = Create(kSide + 1, kSide);
+    DrawEverything(*NewCanvas(bitmap), source.Get(), custom.Get());
+    ExpectWindowUntouched("too wide");
+    EXPECT_EQ(log.Count(ANDROID_LOG_ERROR), 1);
+    EXPECT_EQ(log.Count(ANDROID_LOG_ERROR, "65 x 64 is refused"), 1);
+    log.Clear();
+}
+
+TEST_F(NoFrameBuffer, OfABitmapWhoseTaskWasRefusedNothingIsDrawn) {
+    for (bool const texture : {true, false}) {
+        if (texture) queue->Refuse(1);
+        BitmapPtr const bitmap = Create(kSide, kSide);
+        if (!texture) queue->Refuse(1);
+        DrawEverything(*NewCanvas(bitmap), source.Get(), custom.Get());
+        ExpectWindowUntouched(texture ? "no texture" : "no frame buffer");
+        bitmap->GetTextureBitmap()->GetSubBitmap(0)->Unref(); // the reference of the refused task
+    }
+}
+
+TEST_F(NoFrameBuffer, OfABitmapThatIsYetToBeCreatedNothingIsDrawn) {
+    thread->Call([this] {
+        BitmapPtr const bitmap = Create(kSide, kSide);
+        DrawEverything(*NewCanvas(bitmap, 0), source.Get(), custom.Get());
+    });
+    ExpectWindowUntouched("too early");
+}
+
+TEST_F(NoFrameBuffer, WhatTheHostDrawsItselfWithoutATargetReachesItsWindow) {
+    thread->Call([this] { custom->DrawRT(Matrix4<float>(), MKPaint()); });
+    EXPECT_EQ(ReadWindow().GetColor(kSide - 1, kSide - 1), (Color{255, 255, 255, 255}));
+}
+
+} // namespace
+} // namespace Moka::Testing

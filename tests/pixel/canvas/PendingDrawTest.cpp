@@ -1,0 +1,111 @@
+// A bitmap is read right behind the draws onto it, while the driver's threads may still be sampling its old
+// texels for another one. Every way in which texels leave a bitmap waits for what was drawn last.
+#include "tests/pixel/canvas/CanvasDrawing.h"
+
+#include "moka/graphics/bitmap/IMKSubBitmap.h"
+#include "moka/graphics/bitmap/IMKTextureBitmap.h"
+#include "moka/graphics/bitmap/MKGraphicsFactory.h"
+
+#include <cstdlib>
+#include <functional>
+
+namespace Moka::Testing {
+namespace {
+
+#if defined(__SANITIZE_ADDRESS__) || defined(__SANITIZE_THREAD__)
+constexpr int kRepetitions = 25;
+#else
+constexpr int kRepetitions = 500;
+#endif
+constexpr int kSide = 64;
+constexpr Color kOld{255, 255, 255, 255};
+constexpr Color kNew{0, 0, 255, 255};
+
+// llvmpipe draws on the calling thread where there is one processor, and nothing is then ever pending. Read
+// when the driver is loaded, which is later.
+[[maybe_unused]] int const gThreads = setenv("LP_NUM_THREADS", "2", 0);
+
+class PendingDrawTest : public CanvasDrawing {
+protected:
+    struct Drawn {
+        RefPtr<IMKBitmap> bitmap;
+        RefPtr<IMKCanvas> canvas;
+    };
+
+    Drawn Make() {
+        RenderThread& queue = GetRenderThread();
+        auto bitmap = RefPtr<IMKBitmap>::Adopt(
+            MKGraphicsFactory::CreateBitmap(&queue, kSide, kSide, nullptr, false, 1, false));
+        auto canvas = RefPtr<IMKCanvas>::Adopt(MKGraphicsFactory::CreateCanvas(&queue, bitmap.Get(), 1));
+        return {bitmap, canvas};
+    }
+
+    static void Fill(Drawn const& drawn, Color const& color) {
+        MKPaint paint;
+        paint.SetColor(color[0] / 255.0f, color[1] / 255.0f, color[2] / 255.0f);
+        drawn.canvas->DrawRect(0, 0, kSide, kSide, &paint);
+    }
+
+    // How often read finds anything but the new colour all over.
+    int CountWrong(std::function<TestImage(Drawn const&)> const& read) {
+        TestImage const expected = MakeChecker(kSide, kSide, 1, kNew, kNew);
+        Drawn const drawn = Make();
+        Drawn const other = Make();
+        int wrong = 0;
+        for (int i = 0; i < kRepetitions; ++i) {
+            Fill(drawn, kOld);
+            other.canvas->DrawBitmap(drawn.bitmap.Get(), 0, 0, nullptr);
+            Fill(drawn, kNew);
+            Fill(other, kOld);
+            if (CompareImages(expected, read(drawn)).differingPixels > 0) ++wrong;
+        }
+        return wrong;
+    }
+
+    static TestImage Read(IMKBitmapDataGettable& source) {
+        TestImage image(kSide, kSide);
+        source.GetBitmapData(Rect(0, 0, kSide, kSide), image.pixels.data());
+        return image;
+    }
+};
+
+TEST_F(PendingDrawTest, AReadBackWaits) {
+    EXPECT_EQ(CountWrong([](Drawn const& drawn) { return Read(*drawn.bitmap); }), 0);
+}
+
+TEST_F(PendingDrawTest, TheCloneOfAStripWaits) {
+    EXPECT_EQ(CountWrong([](Drawn const& drawn) {
+                  auto const clone =
+                      RefPtr<IMKSubBitmap>::Adopt(drawn.bitmap->GetTextureBitmap()->GetSubBitmap(0)->Clone());
+                  return Read(*clone);
+              }),
+              0);
+}
+
+// White darkens nothing, so what comes back is the copy that it was compared with. A canvas keeps the copy's
+// texture, and overwriting one that was sampled waits by itself; hence a new canvas each time.
+TEST_F(PendingDrawTest, TheDestinationsCopyForDarkenWaits) {
+    Drawn const white = Make();
+    Fill(white, kOld);
+    EXPECT_EQ(CountWrong([&](Drawn const& drawn) {
+                  MKPaint darken;
+                  darken.SetXFermode(MKPaint::Darken);
+                  auto const canvas = RefPtr<IMKCanvas>::Adopt(
+                      MKGraphicsFactory::CreateCanvas(&GetRenderThread(), drawn.bitmap.Get(), 1));
+                  canvas->DrawBitmap(white.bitmap.Get(), 0, 0, &darken);
+                  return Read(*drawn.bitmap);
+              }),
+              0);
+}
+
+TEST_F(PendingDrawTest, TheCopyOfABitmapDrawnOntoItselfWaits) {
+    kept = 2; // a texture and its frame buffer
+    EXPECT_EQ(CountWrong([](Drawn const& drawn) {
+                  drawn.canvas->DrawBitmap(drawn.bitmap.Get(), 0, 0, nullptr);
+                  return Read(*drawn.bitmap);
+              }),
+              0);
+}
+
+} // namespace
+} // namespace Moka::Testing

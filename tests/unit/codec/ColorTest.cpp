@@ -1,0 +1,342 @@
+// What files say of their colours. Expected values come from the formulas of sRGB, Display P3 and CIE Lab.
+#include "moka/base/log/AndroidLog.h"
+#include "tests/support/ColorProfiles.h"
+#include "tests/support/LogCapture.h"
+#include "tests/unit/codec/CodecTestSupport.h"
+
+#include <algorithm>
+#include <array>
+#include <cmath>
+#include <functional>
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+#include <turbojpeg.h>
+
+namespace Moka::Testing {
+namespace {
+
+using ::testing::AllOf;
+using ::testing::ElementsAre;
+using ::testing::HasSubstr;
+
+using Rgb = std::array<double, 3>; // 0 ... 1
+using Matrix = std::array<Rgb, 3>;
+
+double ToLight(double v) { return v <= 0.04045 ? v / 12.92 : std::pow((v + 0.055) / 1.055, 2.4); }
+double FromLight(double v) {
+    v = std::clamp(v, 0.0, 1.0);
+    return v <= 0.0031308 ? v * 12.92 : 1.055 * std::pow(v, 1 / 2.4) - 0.055;
+}
+
+Rgb operator*(Matrix const& m, Rgb const& v) {
+    Rgb r{};
+    for (std::size_t i = 0; i < 3; ++i) r[i] = m[i][0] * v[0] + m[i][1] * v[1] + m[i][2] * v[2];
+    return r;
+}
+
+// Light of one set of primaries as that of another with the same white.
+constexpr Matrix kP3ToSrgb = {
+    {{1.22494, -0.22494, 0}, {-0.04206, 1.04206, 0}, {-0.01964, -0.07864, 1.09827}}};
+constexpr Matrix kAdobeToSrgb = {{{1.39836, -0.39836, 0}, {0, 1, 0}, {0, -0.04293, 1.04293}}};
+
+Rgb P3ToSrgb(Rgb c) {
+    for (double& v : c) v = ToLight(v);
+    c = kP3ToSrgb * c;
+    for (double& v : c) v = FromLight(v);
+    return c;
+}
+
+// Every pixel, straight, converted and premultiplied again.
+Image Convert(Image image, std::function<Rgb(Rgb)> const& convert) {
+    for (std::size_t i = 0; i < image.pixels.size(); i += 4) {
+        unsigned char* const pixel = &image.pixels[i];
+        double const alpha = pixel[3];
+        if (pixel[3] == 0) continue;
+        Rgb const c = convert({pixel[0] / alpha, pixel[1] / alpha, pixel[2] / alpha});
+        for (std::size_t k = 0; k < 3; ++k) pixel[k] = static_cast<unsigned char>(std::lround(c[k] * alpha));
+    }
+    return image;
+}
+
+Image Fill(int side, Bytes const& pixel) {
+    Image image = MakeImage(side, side);
+    for (std::size_t i = 0; i < image.pixels.size(); ++i) image.pixels[i] = pixel[i % 4];
+    return image;
+}
+
+// Grey, or of four inks, as the library writes it.
+Bytes MakeJpeg(Bytes const& pixel, int format, int subsampling) {
+    Bytes pixels;
+    for (int i = 0; i < 256; ++i) pixels.insert(pixels.end(), pixel.begin(), pixel.end());
+    tjhandle const handle = tjInitCompress();
+    unsigned char* encoded = nullptr;
+    unsigned long size = 0;
+    EXPECT_EQ(tjCompress2(handle, pixels.data(), 16, 0, 16, format, &encoded, &size, subsampling, 100, 0), 0);
+    Bytes const bytes(encoded, encoded + size);
+    tjFree(encoded);
+    tjDestroy(handle);
+    return bytes;
+}
+
+void AppendFixed(Bytes& bytes, double value) {
+    auto const scaled = static_cast<unsigned>(std::lround(value * 100000));
+    for (int shift = 24; shift >= 0; shift -= 8) bytes.push_back(static_cast<unsigned char>(scaled >> shift));
+}
+
+Bytes MakeNumbers(char const* type, std::vector<double> const& values) {
+    Bytes content;
+    for (double const value : values) AppendFixed(content, value);
+    return MakePngChunk(type, content);
+}
+
+Bytes operator+(Bytes a, Bytes const& b) { return Insert(std::move(a), a.size(), b); }
+
+std::vector<double> const kSrgbPrimaries{0.3127, 0.3290, 0.64, 0.33, 0.30, 0.60, 0.15, 0.06};
+std::vector<double> const kAdobePrimaries{0.3127, 0.3290, 0.64, 0.33, 0.21, 0.71, 0.15, 0.06};
+
+TEST(Color, ADisplayP3ImageBecomesSrgbInEveryFormatAndAtEverySize) {
+    ErrorLines const errors;
+    TempFolder const folder;
+    Bytes const profile = MakeProfile(ProfileKind::DisplayP3);
+    Image const image = MakeGradient(64, 48, true);
+    for (std::string const extension : {"png", "webp"}) {
+        std::string const path = folder.Path("p3." + extension);
+        WriteFile(path, EmbedProfile(Encode(image, extension), profile));
+        Image const expected = Convert(image, P3ToSrgb);
+        EXPECT_LE(LargestDifference(DecodeFile(path), expected), 1) << extension;
+        EXPECT_LE(LargestDifference(DecodeScaled(path, 21, 30), Scale(expected, 21, 30)), 12) << extension;
+        EXPECT_EQ(GetInfo(path).profile, "Display P3");
+    }
+    // Transparent pixels: what they hold is straight in the file, and rounded there.
+    Image const veil = MakeGradient(64, 48, false);
+    Image const converted = Decode(EmbedProfile(Encode(veil, "png"), profile));
+    EXPECT_LE(LargestDifference(converted, Convert(veil, P3ToSrgb)), 3);
+    // As "transicc -i p3.icc -o '*sRGB'" says.
+    std::pair<Bytes, Bytes> const known[] = {{{200, 100, 50, 255}, {215, 93, 31, 255}},
+                                             {{30, 200, 90, 255}, {0, 204, 73, 255}},
+                                             {{90, 90, 90, 255}, {90, 90, 90, 255}}};
+    for (auto const& [before, after] : known) {
+        Bytes const file = Encode(Fill(16, before), "jpg");
+        // In one part, and in several out of order.
+        for (std::size_t const part : {60000, 100}) {
+            Image const decoded = Decode(EmbedProfile(file, profile, part));
+            EXPECT_LE(LargestDifference(decoded, Fill(16, after)), 2) << int{before[0]};
+        }
+    }
+}
+
+TEST(Color, GreyAndInkHaveProfilesOfTheirOwn) {
+    ErrorLines const errors;
+    Bytes const grey = MakeJpeg({55}, TJPF_GRAY, TJSAMP_GRAY);
+    auto const light = static_cast<unsigned char>(std::lround(255 * FromLight(55 / 255.0)));
+    EXPECT_LE(LargestDifference(Decode(EmbedProfile(grey, MakeProfile(ProfileKind::LinearGrey))),
+                                Fill(16, {light, light, light, 255})),
+              1);
+    EXPECT_EQ(Decode(EmbedProfile(grey, MakeProfile(ProfileKind::Srgb))), Decode(grey));
+    // Adobe's marker: 255 is no ink. What they are is told by "transicc -i cmyk.icc -o '*sRGB'".
+    Bytes const cmyk = MakeProfile(ProfileKind::Cmyk);
+    std::pair<Bytes, Bytes> const inks[] = {{{255, 255, 255, 255}, {255, 255, 255, 255}},
+                                            {{255, 255, 255, 0}, {0, 0, 0, 255}},
+                                            {{0, 255, 255, 255}, {0, 138, 186, 255}}};
+    for (auto const& [ink, color] : inks) {
+        Bytes file = EmbedProfile(MakeJpeg(ink, TJPF_CMYK, TJSAMP_444), cmyk);
+        EXPECT_LE(LargestDifference(Decode(file), Fill(16, color)), 3) << int{ink[0]} << ' ' << int{ink[3]};
+    }
+}
+
+TEST(Color, GammaAndPrimariesOfAPngAreConverted) {
+    ErrorLines const errors;
+    TempFolder const folder;
+    struct {
+        Bytes chunks;
+        std::function<double(double)> decode; // to light
+        Matrix matrix;
+        char const* told;
+    } const cases[] = {
+        {MakeNumbers("gAMA", {1.0}), nullptr, {}, "gamma 1"},
+        {MakeNumbers("gAMA", {0.2}), nullptr, {}, "gamma 0.2"},
+        {MakeNumbers("cHRM", kAdobePrimaries) + MakeNumbers("gAMA", {0.45455}),
+         [](double v) { return std::pow(v, 2.2); }, kAdobeToSrgb, "gamma 0.45455, own primaries"},
+        {MakeNumbers("cHRM", kAdobePrimaries), ToLight, kAdobeToSrgb, "own primaries"},
+        {MakeNumbers("cHRM", kSrgbPrimaries) + MakeNumbers("gAMA", {1.0}), nullptr, {}, "gamma 1"},
+    };
+    Image const image = MakeGradient(40, 30, true);
+    for (auto const& one : cases) {
+        std::string const path = folder.Path("a.png");
+        WriteFile(path, PutBeforePixels(Encode(image, "png"), one.chunks));
+        double const gamma = std::string(one.told) == "gamma 0.2" ? 0.2 : 1;
+        Image const expected = Convert(image, [&](Rgb c) {
+            // Gamma alone is corrected for a display of gamma 2.2.
+            if (!one.decode)
+                return Rgb{std::pow(c[0], 1 / gamma / 2.2), std::pow(c[1], 1 / gamma / 2.2),
+                           std::pow(c[2], 1 / gamma / 2.2)};
+            for (double& v : c) v = one.decode(v);
+            c = one.matrix * c;
+            for (double& v : c) v = FromLight(v);
+            return c;
+        });
+        EXPECT_LE(LargestDifference(DecodeFile(path), expected), 2) << one.told;
+        EXPECT_EQ(GetInfo(path).profile, one.told);
+    }
+}
+
+TEST(Color, WhatSaysSrgbOrNothingKeepsEveryByte) {
+    ErrorLines const errors;
+    Image const image = MakeTranslucentNoise(33, 21);
+    Bytes const png = Encode(image, "png");
+    Find(png, {'s', 'R', 'G', 'B'}); // what this library saves is marked
+    Bytes const srgb = MakeProfile(ProfileKind::Srgb);
+    Bytes const files[] = {PutBeforePixels(png, {}),
+                           PutBeforePixels(png, MakeNumbers("gAMA", {0.45455})),
+                           PutBeforePixels(png, MakeNumbers("cHRM", kSrgbPrimaries)),
+                           PutBeforePixels(png, MakePngChunk("sRGB", {0}) + MakeNumbers("gAMA", {1.0})),
+                           EmbedProfile(png, srgb),
+                           EmbedProfile(Encode(image, "webp"), srgb)};
+    for (Bytes const& file : files) EXPECT_EQ(Decode(file), image) << &file - files;
+    Bytes const jpeg = Encode(image, "jpg");
+    EXPECT_EQ(Decode(EmbedProfile(jpeg, srgb)), Decode(jpeg));
+}
+
+TEST(Color, AProfileThatCannotBeUsedIsIgnoredWithOneWarning) {
+    Image const image = MakeGradient(16, 16, false);
+    Bytes const p3 = MakeProfile(ProfileKind::DisplayP3);
+    Bytes const profiles[] = {{},
+                              {1, 2, 3},
+                              Bytes(5000, 0xFF),
+                              Bytes(p3.begin(), p3.begin() + 200),
+                              Replace(p3, 36, {'x'}),
+                              MakeProfile(ProfileKind::Cmyk),
+                              MakeProfile(ProfileKind::Link)};
+    for (std::string const extension : {"png", "webp", "jpg"}) {
+        Bytes const plain = Encode(image, extension);
+        Image const expected = Decode(plain);
+        for (Bytes const& profile : profiles) {
+            if (profile.empty() && extension != "webp") continue;
+            SCOPED_TRACE(extension + " " + std::to_string(&profile - profiles));
+            LogCapture const log;
+            EXPECT_EQ(Decode(EmbedProfile(plain, profile), "some/folder/odd.img"), expected);
+            EXPECT_THAT(log.GetTexts(ANDROID_LOG_WARN),
+                        ElementsAre(HasSubstr("'odd.img': its colour profile is ignored: ")));
+            EXPECT_EQ(log.GetTexts().size(), 1u);
+        }
+    }
+    // A part of a JPEG's is missing, or there twice.
+    Bytes const jpeg = Encode(image, "jpg");
+    Bytes parts = EmbedProfile(jpeg, p3, 100);
+    parts[17] = 2;
+    LogCapture const log;
+    EXPECT_EQ(Decode(parts), Decode(jpeg));
+    EXPECT_EQ(log.Count(ANDROID_LOG_WARN), 1);
+}
+
+// Bytes of a profile that are wrong anywhere: some image comes, and nothing is kept or overrun.
+TEST(Color, AChangedByteOfAProfileIsHarmless) {
+    LogCapture const log;
+    Image const image = MakeOpaqueNoise(4, 4);
+    for (ProfileKind const kind : {ProfileKind::DisplayP3, ProfileKind::Cmyk}) {
+        Bytes const profile = MakeProfile(kind);
+        Bytes const plain =
+            kind == ProfileKind::Cmyk ? MakeJpeg({1, 2, 3, 4}, TJPF_CMYK, TJSAMP_444) : Encode(image, "webp");
+        for (std::size_t i = 0; i < profile.size(); i += kind == ProfileKind::Cmyk ? 23 : 5) {
+            Bytes changed = profile;
+            changed[i] = static_cast<unsigned char>(~changed[i]);
+            Image const decoded = Decode(EmbedProfile(plain, changed));
+            ASSERT_FALSE(decoded.pixels.empty()) << i;
+            for (std::size_t p = 3; p < decoded.pixels.size(); p += 4) ASSERT_EQ(decoded.pixels[p], 255) << i;
+        }
+    }
+    EXPECT_EQ(log.Count(ANDROID_LOG_ERROR), 0);
+}
+
+// The directory of a camera: two entries, of which the second is the orientation.
+Bytes MakeExif(bool isBigEndian, unsigned char orientation) {
+    if (isBigEndian)
+        return {'M', 'M',  0, 42, 0, 0, 0, 8, 0, 2,           1, 0x0F, 0, 2, 0, 0, 0, 1, 0, 0, 0, 0, //
+                1,   0x12, 0, 3,  0, 0, 0, 1, 0, orientation, 0, 0};
+    return {'I',  'I', 42, 0, 8, 0, 0, 0, 2,           0, 0x0F, 1, 2, 0, 1, 0, 0, 0, 0, 0, 0, 0, //
+            0x12, 1,   3,  0, 1, 0, 0, 0, orientation, 0, 0,    0};
+}
+
+TEST(Metadata, OrientationIsToldAndNotApplied) {
+    ErrorLines const errors;
+    TempFolder const folder;
+    Image const image = MakeGradient(24, 16, true);
+    for (bool const isBigEndian : {true, false}) {
+        for (auto const& [noted, told] : {std::pair<unsigned char, int>{9, 1}, {0, 1}, {1, 1}, {6, 6}}) {
+            Bytes const exif = MakeExif(isBigEndian, noted);
+            Bytes const app1 = Bytes{'E', 'x', 'i', 'f', 0, 0} + exif;
+            Bytes const jpeg = Encode(image, "jpg");
+            Bytes const webp = Encode(image, "webp");
+            std::pair<Bytes, Bytes> const files[] = {
+                {jpeg,
+                 Insert(jpeg, 2, Bytes{0xFF, 0xE1, 0, static_cast<unsigned char>(app1.size() + 2)} + app1)},
+                {Encode(image, "png"), PutBeforePixels(Encode(image, "png"), MakePngChunk("eXIf", exif))},
+                {webp, MakeWebpFile(8, 24, 16,
+                                    Bytes(webp.begin() + 12, webp.end()) + MakeWebpChunk("EXIF", exif))}};
+            for (auto const& [plain, marked] : files) {
+                WriteFile(folder.Path("photo"), marked);
+                EXPECT_EQ(GetInfo(folder.Path("photo")).orientation, told) << int{noted};
+                EXPECT_EQ(DecodeFile(folder.Path("photo")), Decode(plain));
+            }
+            // Cut anywhere it says nothing, and is not read beyond its end.
+            for (std::size_t size = 0; noted == 6 && size < exif.size() - 4; ++size) {
+                Bytes const cut(exif.begin(), exif.begin() + static_cast<std::ptrdiff_t>(size));
+                WriteFile(folder.Path("cut"), PutBeforePixels(files[1].first, MakePngChunk("eXIf", cut)));
+                EXPECT_EQ(GetInfo(folder.Path("cut")).orientation, 1) << size;
+            }
+        }
+    }
+}
+
+// A frame at (x, y), from a lossless file of our own.
+Bytes MakeFrame(Image const& image, int x, int y) {
+    Bytes const file = Encode(image, "webp");
+    Bytes content;
+    for (int const value : {x / 2, y / 2, image.width - 1, image.height - 1, 100}) {
+        for (int shift = 0; shift < 24; shift += 8)
+            content.push_back(static_cast<unsigned char>(value >> shift));
+    }
+    content.push_back(0);
+    return MakeWebpChunk("ANMF", content + Bytes(file.begin() + 12, file.end()));
+}
+
+TEST(Animation, TheFirstFrameOfAWebpIsDecodedWhereItLies) {
+    ErrorLines errors;
+    TempFolder const folder;
+    Image const frame = MakeTranslucentNoise(10, 6);
+    Bytes const head = MakeWebpChunk("ANIM", {255, 255, 255, 255, 0, 0});
+    Bytes const second = MakeFrame(MakeOpaqueNoise(20, 12), 0, 0);
+    Bytes const file = MakeWebpFile(0x12, 20, 12, head + MakeFrame(frame, 4, 2) + second);
+    Image expected = MakeImage(20, 12);
+    for (int y = 0; y < 6; ++y)
+        std::copy_n(frame.Row(y), frame.GetStride(),
+                    &expected.pixels[static_cast<std::size_t>(y + 2) * 80 + 16]);
+    WriteFile(folder.Path("a.webp"), file);
+    EXPECT_EQ(DecodeFile(folder.Path("a.webp")), expected);
+    EXPECT_EQ(DecodeScaled(folder.Path("a.webp"), 7, 5), Scale(expected, 7, 5));
+    EXPECT_EQ(GetInfo(folder.Path("a.webp")).frames, 2);
+    // Half of the second frame, no frame, and one that leaves the canvas.
+    Bytes const cut(file.begin(), file.end() - 40);
+    Bytes const empty = MakeWebpFile(0x12, 20, 12, head);
+    Bytes const outside = MakeWebpFile(0x12, 20, 12, head + MakeFrame(frame, 12, 2));
+    for (Bytes const& bad : {cut, empty, outside}) {
+        EXPECT_TRUE(Decode(bad).pixels.empty());
+        EXPECT_EQ(errors.Take().size(), 1u);
+    }
+}
+
+TEST(Animation, OfAPngTheDefaultImageIsDecoded) {
+    ErrorLines const errors;
+    TempFolder const folder;
+    Image const image = MakeTranslucentNoise(9, 7);
+    WriteFile(folder.Path("a.png"),
+              PutBeforePixels(Encode(image, "png"), MakePngChunk("acTL", {0, 0, 0, 12, 0, 0, 0, 0})));
+    EXPECT_EQ(DecodeFile(folder.Path("a.png")), image);
+    EXPECT_EQ(GetInfo(folder.Path("a.png")).frames, 12);
+    WriteFile(folder.Path("b.png"), Encode(image, "png"));
+    EXPECT_EQ(GetInfo(folder.Path("b.png")).frames, 1);
+    EXPECT_EQ(GetInfo(folder.Path("b.png")).profile, "sRGB");
+}
+
+} // namespace
+} // namespace Moka::Testing
