@@ -38,7 +38,7 @@ public:
     // else and once after everything. Attach reads the device's capabilities and resets the statistics; false
     // (one error line) when the context is not OpenGL ES 3.0 or another one is attached. Without a loader
     // there are no driver messages and no object labels. Detach deletes pooled and orphaned GL names; objects
-    // that are still alive become inert and may be released later.
+    // that are still alive become inert and may be released later; a program works again in the next context.
     static bool AttachContext(RendererLimits const& limits = {}, RendererProcLoader loader = nullptr);
     static void DetachContext();
 

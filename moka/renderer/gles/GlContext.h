@@ -18,6 +18,7 @@
 #include "moka/renderer/gles/GlWorkarounds.h"
 
 #include <atomic>
+#include <memory>
 #include <mutex>
 #include <thread>
 #include <vector>
@@ -36,7 +37,7 @@ struct GlVertices {
     GLsizei count;
 };
 
-class GlContext {
+class GlContext : public std::enable_shared_from_this<GlContext> {
 public:
     // On the render thread, which is the calling one, with the context current.
     explicit GlContext(RendererProcLoader loader);

@@ -21,22 +21,42 @@ private:
     int const mIndex;
 };
 
+char const* TextOf(char const* text) { return text ? text : ""; }
+
 } // namespace
 
 GlProgram::GlProgram(std::shared_ptr<GlContext> const& context, char const* vertexSource,
-                     char const* fragmentSource, char const* name) {
-    char const* const label = name ? name : "";
-    GlBuiltProgram const built =
-        context ? BuildGlProgram(*context, vertexSource, fragmentSource, label) : GlBuiltProgram{};
-    if (built.name != 0) {
-        ++context->statistics.programs;
-        context->debug.Label(GL_PROGRAM_KHR, built.name, label);
-    }
-    mUniforms = std::make_shared<GlUniforms>(context, built.name, label);
+                     char const* fragmentSource, char const* name)
+    : mVertexSource(TextOf(vertexSource)), mFragmentSource(TextOf(fragmentSource)), mName(TextOf(name)) {
+    GlBuiltProgram const built = context ? Build(*context) : GlBuiltProgram{};
+    mUniforms = std::make_shared<GlUniforms>(context, built.name, mName.c_str());
     if (built.isPlaceholder) mUniforms->SetPlaceholder();
 }
 
-void GlProgram::MakeCurrent() { mUniforms->MakeCurrent(mUniforms); }
+GlBuiltProgram GlProgram::Build(GlContext& context) const {
+    GlBuiltProgram const built =
+        BuildGlProgram(context, mVertexSource.c_str(), mFragmentSource.c_str(), mName.c_str());
+    if (built.name != 0) {
+        ++context.statistics.programs;
+        context.debug.Label(GL_PROGRAM_KHR, built.name, mName.c_str());
+    }
+    return built;
+}
+
+void GlProgram::MakeCurrent() {
+    GlContext* const attached = GlContext::GetAttached();
+    if (attached && mUniforms->HasLostContext()) MoveTo(*attached);
+    mUniforms->MakeCurrent(mUniforms);
+}
+
+void GlProgram::MoveTo(GlContext& context) {
+    GlOperation const operation(context);
+    if (!operation) return;
+    GlBuiltProgram const built = Build(context);
+    if (built.name == 0) return;
+    mUniforms->MoveTo(context.shared_from_this(), built.name);
+    if (built.isPlaceholder) mUniforms->SetPlaceholder();
+}
 
 void GlProgram::Release() {
     mUniforms->DeleteProgram();

@@ -4,6 +4,7 @@
 #include "moka/renderer/gles/GlContext.h"
 #include "moka/renderer/gles/GlTables.h"
 
+#include <algorithm>
 #include <cstring>
 #include <utility>
 
@@ -98,6 +99,18 @@ void GlUniforms::Set(int index, void const* value) {
     // Setting needs the program to be GL's current one; another one's values wait until it is.
     if (!operation || !mContext->IsThrough() || mContext->state.program.Get() != mProgram) return;
     Send(uniform, &mValues[uniform.offset]);
+}
+
+bool GlUniforms::HasLostContext() const { return mContext && !mContext->IsAttached(); }
+
+void GlUniforms::MoveTo(std::shared_ptr<GlContext> context, GLuint program) {
+    mContext = std::move(context);
+    mProgram = program;
+    listed = {}; // that was a list of the other context's
+    for (Uniform& uniform : mUniforms) {
+        uniform.location = glGetUniformLocation(mProgram, uniform.name.c_str());
+    }
+    std::fill(mSent.begin(), mSent.end(), static_cast<unsigned char>(0));
 }
 
 void GlUniforms::MakeCurrent(std::shared_ptr<GlUniforms> const& self) {

@@ -53,6 +53,11 @@ public:
     // Within an operation: makes it GL's current program, with these values.
     void PutInForce(unsigned char const* values);
 
+    // Its context was detached: nothing of it is left in GL.
+    bool HasLostContext() const;
+    // The same program, linked anew in another context: handles and values stay.
+    void MoveTo(std::shared_ptr<GlContext> context, GLuint program);
+
     void MakeCurrent(std::shared_ptr<GlUniforms> const& self);
     void DeleteProgram();
 
@@ -67,7 +72,7 @@ private:
     void AddUniform(GLuint index, char const* programName);
     void Send(Uniform const& uniform, unsigned char const* value);
 
-    std::shared_ptr<GlContext> const mContext;
+    std::shared_ptr<GlContext> mContext;
     GLuint mProgram;
     bool mIsPlaceholder = false;
     std::vector<Uniform> mUniforms;

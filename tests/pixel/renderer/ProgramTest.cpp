@@ -259,27 +259,43 @@ TEST_F(ProgramTest, ReleaseDeletesTheProgramAndItsHandlesLiveOnInert) {
     EXPECT_EQ(Draw(), kClear);
 }
 
-TEST_F(ProgramTest, WithoutItsContextAProgramIsInert) {
+TEST_F(ProgramTest, InTheNextContextItIsBuiltAgainWithItsHandlesAndValues) {
     ProgramPtr program = MakeProgram(kVertex, kUniformColor);
     ParameterPtr const color = Find(program, "color");
+    program->MakeCurrent();
+    Set(color, Numbers{0, 1, 0, 1});
+    EXPECT_EQ(Draw(), kGreen);
+    mImage = {};
     RendererFactory::DetachContext();
     ProgramPtr const homeless = MakeProgram(kVertex, kUniformColor);
     ASSERT_TRUE(homeless);
     EXPECT_EQ(TakeErrors().size(), 1u);
+    program->MakeCurrent(); // there is no context to be built in
     RestartEgl();
     ASSERT_TRUE(Attach());
-    ProgramPtr const stranger = MakeProgram(kVertex, kUniformColor);
-    GLuint const name = MakeCurrent(stranger);
-    for (IShaderProgram* const old : {program.get(), homeless.get()}) {
-        old->MakeCurrent();
-        Set(color, Numbers{1, 0, 0, 1});
-        Set(ParameterPtr(old->GetParameter("color")), Numbers{1, 0, 0, 1});
-    }
-    EXPECT_EQ(Find(homeless, "color")->GetType(), BindingTypeUnknown);
+    mImage = MakeOffscreen(Image(2, 2));
+    mImage.target->Activate();
+    ProgramPtr const other = MakeProgram(kVertex, kUniformColor);
+    other->MakeCurrent();
+    EXPECT_EQ(RendererFactory::GetStatistics().programs, 1) << "built when it is used";
+
+    GLuint const name = MakeCurrent(program);
+    EXPECT_EQ(Draw(), kGreen);
+    Set(color, Numbers{1, 0, 0, 1});
+    EXPECT_EQ(Draw(), kRed);
+    Set(Find(program, "color"), Numbers{0, 0, 1, 1});
+    EXPECT_EQ(Draw(), kBlue);
+    EXPECT_EQ(MakeCurrent(program), name);
+    EXPECT_EQ(RendererFactory::GetStatistics().programs, 2);
     program.reset();
-    EXPECT_TRUE(glIsProgram(name));
-    EXPECT_EQ(GetInteger(GL_CURRENT_PROGRAM), static_cast<GLint>(name));
-    EXPECT_EQ(RendererFactory::GetStatistics().programs, 1);
+    EXPECT_FALSE(glIsProgram(name));
+
+    // One that never had a context has no parameters.
+    GLuint const current = MakeCurrent(other);
+    homeless->MakeCurrent();
+    EXPECT_EQ(Find(homeless, "color")->GetType(), BindingTypeUnknown);
+    Set(Find(homeless, "color"), Numbers{1, 0, 0, 1});
+    EXPECT_EQ(GetInteger(GL_CURRENT_PROGRAM), static_cast<GLint>(current));
 }
 
 } // namespace
