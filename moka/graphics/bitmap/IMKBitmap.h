@@ -28,7 +28,8 @@ public:
     virtual void SetTag(char const* tag) = 0;
     virtual char const* GetTag() = 0;
 
-    // A caller-side bitmap over the same image, holding one reference; null when memory runs out.
+    // A caller-side bitmap over the same image, holding one reference; of a screen bitmap, over the other of the
+    // host's two frame buffers. Null without a queue and when memory runs out.
     virtual IMKBitmap* Clone() = 0;
 
     virtual IGLMsgQueue* GetMsgQueue() = 0;

@@ -18,7 +18,8 @@ public:
     virtual void DetachDepthBuffer() = 0;
 
     // pixels stays valid until the render thread has run the upload. It addresses the first pixel of what is
-    // replaced: everything, or r. Each strip of a tall bitmap gets the same pointer.
+    // replaced: everything, or r. Each strip of a tall bitmap gets the same pointer and the same r: the whole
+    // bitmap's rows say which strips r touches, but in each of them r counts from that strip's own first row.
     virtual void UpdateBitmap(void const* pixels, int stride) = 0;
     virtual void UpdateBitmap(Rect const& r, void const* pixels, int stride) = 0;
 };

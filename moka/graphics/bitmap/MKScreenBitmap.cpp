@@ -1,5 +1,6 @@
 #include "moka/graphics/bitmap/MKScreenBitmap.h"
 
+#include "moka/graphics/bitmap/BlockingRead.h"
 #include "moka/graphics/task/WorkerTask.h"
 #include "moka/renderer/IRenderTarget.h"
 

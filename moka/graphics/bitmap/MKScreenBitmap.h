@@ -5,12 +5,16 @@
 // Thread: any, except that the blocking reads wait for the render thread and so must not be called on it.
 #pragma once
 
-#include "moka/graphics/bitmap/BlockingRead.h"
+#include "moka/base/RefPtr.h"
 #include "moka/graphics/bitmap/MKScreenBitmapBase.h"
 
 #include <utility>
 
 namespace Moka {
+
+namespace detail {
+class BlockingRead;
+}
 
 class MOKA_API MKScreenBitmap : public MKScreenBitmapBase {
 public:
@@ -32,7 +36,7 @@ private:
     void createRenderTargetRT(int width, int height, FramebufferType type, bool release);
     void getPixelRT(unsigned int& result, Point const& p);
     void getPixelAsyncRT(Point const& p, void* userData, PixelCallback callback);
-    void getBitmapDataRT(Rect const& r, void* destination, detail::BlockingRead::Ptr const& read);
+    void getBitmapDataRT(Rect const& r, void* destination, RefPtr<detail::BlockingRead> const& read);
     void getBitmapDataAsyncRT(Rect const& r, void* destination, void* userData, DataCallback callback);
 
     // Takes the task's reference and posts. False when the task never runs.

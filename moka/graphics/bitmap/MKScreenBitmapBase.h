@@ -4,6 +4,9 @@
 //         counts a reference.
 // Thread: the getters anywhere; everything ending in RT, and the protected bodies, on the render thread.
 // Fails:  without a render target (an unknown type gives one error line) nothing is drawn or read.
+// Units:  GetBitmapData gives the frame buffer's own rows, the bottom one first, counted from its corner, not from
+//         where the bitmap lies. GetPixel counts from the top but is one row off: row y reads row y - 1, and row
+//         0 reads 0.
 // Limits: there is no stencil of ours: clips that need one (turned ones, and all operations but Intersect and
 //         Replace) do not work on a screen bitmap.
 #pragma once

@@ -1,5 +1,6 @@
 #include "moka/graphics/bitmap/MKSubBitmap.h"
 
+#include "moka/graphics/bitmap/BlockingRead.h"
 #include "moka/graphics/bitmap/MKDepthStencilBuffer.h"
 #include "moka/graphics/bitmap/MKFrameBuffer.h"
 #include "moka/graphics/task/WorkerTask.h"

@@ -6,14 +6,18 @@
 //         run.
 #pragma once
 
+#include "moka/base/RefPtr.h"
 #include "moka/graphics/bitmap/BitmapTag.h"
-#include "moka/graphics/bitmap/BlockingRead.h"
 #include "moka/graphics/bitmap/MKSubBitmapBase.h"
 
 #include <mutex>
 #include <utility>
 
 namespace Moka {
+
+namespace detail {
+class BlockingRead;
+}
 
 class MOKA_API MKSubBitmap : public MKSubBitmapBase {
 public:
@@ -55,9 +59,9 @@ private:
     void detachDepthBufferRT();
     void updateBitmapRT(void const* pixels, int stride);
     void updateBitmapRectRT(Rect const& r, void const* pixels, int stride);
-    void getPixelRT(Point const& p, detail::BlockingRead::Ptr const& read, void* userData,
+    void getPixelRT(Point const& p, RefPtr<detail::BlockingRead> const& read, void* userData,
                     PixelCallback callback);
-    void getBitmapDataRT(Rect const& r, void* destination, detail::BlockingRead::Ptr const& read,
+    void getBitmapDataRT(Rect const& r, void* destination, RefPtr<detail::BlockingRead> const& read,
                          void* userData, DataCallback callback);
     void setTagRT(char const* tag);
     void copyTextureRT(MKSubBitmapBase* target);

@@ -46,7 +46,8 @@ public:
     bool RequestLoad(int id, String const& path, IGLMsgQueue* queue);
     bool RequestLoad(int id, String const& path, IGLMsgQueue* queue, int width, int height);
 
-    // What has not called back yet never will, also when it is being decoded; its id is free again.
+    // A load that waits or is being decoded never calls back; its id is free again. One whose OnCallbackPending
+    // was called still calls back: after a cancel, WaitForCallback() returns when that is over.
     void CancelLoadRequest(int id);
     void CancelAllLoadRequest();
 
