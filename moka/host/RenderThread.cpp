@@ -4,7 +4,7 @@
 #include "moka/base/RunGuarded.h"
 #include "moka/base/Thread.h"
 #include "moka/graphics/task/WorkerTask.h"
-#include "moka/host/EglContext.h"
+#include "moka/host/HostContext.h"
 #include "moka/renderer/IRendererDeviceCaps.h"
 
 #include <atomic>
@@ -64,11 +64,9 @@ struct RenderThread::Impl {
             return started.set_value("another RenderThread is running in this process; stop it first");
         }
         std::string error;
-        context = detail::EglContext::Open({options.debugContext, options.surfaceWidth, options.surfaceHeight,
-                                            options.nativeWindow, options.nativeDisplay},
-                                           &error);
+        context = detail::HostContext::Open(options, &error);
         if (!context) return started.set_value(std::move(error));
-        if (!RendererFactory::AttachContext(options.limits, eglGetProcAddress)) {
+        if (!RendererFactory::AttachContext(options.limits, context->GetLoader())) {
             error = "the renderer refused the context reached through " + context->GetPath() +
                     "; its line in the log says why";
             context.reset();
@@ -101,7 +99,7 @@ struct RenderThread::Impl {
     RenderThread& owner;
     RenderThreadOptions const options;
     RenderContextInfo info;
-    std::unique_ptr<detail::EglContext> context; // made and destroyed on the thread
+    std::unique_ptr<detail::HostContext> context; // made and destroyed on the thread
     std::promise<std::string> started;           // an error, or empty
     Thread thread;
 };

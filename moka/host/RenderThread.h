@@ -4,6 +4,8 @@
 //          context; the next may start when the one before has been stopped.
 // Thread:  Start, Stop and destruction on one thread; the rest from any.
 // Fails:   Start returns null and says what was tried and what to install.
+// Driver:  linked with moka_host_null in the place of moka_host, there is none, and no GL: images are real, draws
+//          are counted and draw nothing.
 // GL:      headless, it reaches a driver through the device platform, without a surface, or with a pbuffer,
 //          whichever answers first with OpenGL ES 3.0, RGBA8888 and a stencil; or in a window handed in.
 #pragma once
