@@ -2,7 +2,7 @@
 // fills it (DrawListBuilder), Device::Submit reads it.
 #pragma once
 
-#include "moka/renderer/device/DrawState.h"
+#include "moka/renderer/device/RunState.h"
 
 #include <variant>
 #include <vector>
@@ -65,7 +65,7 @@ using Command =
 
 struct DrawList {
     std::vector<Command> commands;
-    std::vector<DrawState> states;
+    std::vector<RunState> states;
     std::vector<unsigned char> uniforms;
     std::vector<float> vertices;
 };

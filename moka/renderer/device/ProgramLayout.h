@@ -4,7 +4,7 @@
 #pragma once
 
 #include "moka/renderer/IParameterBinding.h"
-#include "moka/renderer/device/DrawState.h"
+#include "moka/renderer/device/RunState.h"
 
 #include <string>
 #include <vector>

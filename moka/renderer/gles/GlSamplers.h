@@ -3,7 +3,7 @@
 // Thread: render thread.
 #pragma once
 
-#include "moka/renderer/device/DrawState.h"
+#include "moka/renderer/device/RunState.h"
 #include "moka/renderer/gles/GlFunctions.h"
 
 #include <vector>

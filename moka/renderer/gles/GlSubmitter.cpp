@@ -19,14 +19,14 @@ void GlSubmitter::Submit(DrawList const& list) {
 }
 
 void GlSubmitter::Execute(Run const& run) {
-    DrawState const& state = mList->states[run.state];
+    RunState const& state = mList->states[run.state];
     if (&state != mApplied) Apply(state);
     mDevice.programs.Apply(state.program, mList->uniforms.data() + run.uniforms);
     Gl::DrawArrays(ToGlPrimitive(state.primitive), run.first, run.count);
     ++mDevice.counters.draws;
 }
 
-void GlSubmitter::Apply(DrawState const& state) {
+void GlSubmitter::Apply(RunState const& state) {
     TargetRef const& target = state.target;
     mDevice.host.BindTarget(target.frameBuffer, target.width, target.height);
     // A buffer that nothing reads or writes may stay attached or not.

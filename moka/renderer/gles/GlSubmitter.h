@@ -23,7 +23,7 @@ private:
     void Execute(TargetCopy const& copy);
     void Execute(TextureDraw const& draw);
 
-    void Apply(DrawState const& state);
+    void Apply(RunState const& state);
     void BindForClear(TargetRef const& target);
     void ClearColor(float const* color);
     void BeginCopy();
@@ -32,7 +32,7 @@ private:
 
     GlDevice& mDevice;
     DrawList const* mList = nullptr;
-    DrawState const* mApplied = nullptr; // null after anything but a run
+    RunState const* mApplied = nullptr; // null after anything but a run
 };
 
 } // namespace Moka::detail

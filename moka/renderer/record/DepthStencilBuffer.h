@@ -3,7 +3,7 @@
 #pragma once
 
 #include "moka/renderer/IDepthStencilBuffer.h"
-#include "moka/renderer/device/DrawState.h"
+#include "moka/renderer/device/RunState.h"
 
 #include <memory>
 

@@ -3,7 +3,7 @@
 // Thread: render thread, within a request.
 #pragma once
 
-#include "moka/renderer/device/DrawState.h"
+#include "moka/renderer/device/RunState.h"
 
 #include <deque>
 

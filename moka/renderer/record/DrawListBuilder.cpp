@@ -25,7 +25,7 @@ bool DrawListBuilder::IsUndrawnEnd(ListVertices const& vertices) const {
            vertices.offset + vertices.size == mList.vertices.size();
 }
 
-void DrawListBuilder::AddDraw(DrawState const& state, bool isKnownSame, ProgramState& program,
+void DrawListBuilder::AddDraw(RunState const& state, bool isKnownSame, ProgramState& program,
                               ListVertices const& vertices, int first, int count) {
     int const start = static_cast<int>(vertices.offset / vertices.stride) + first;
     Run const run{AddState(state, isKnownSame), AddValues(program), start, count};
@@ -33,7 +33,7 @@ void DrawListBuilder::AddDraw(DrawState const& state, bool isKnownSame, ProgramS
     mDrawnFloats = std::max(mDrawnFloats, vertices.offset + vertices.size);
 }
 
-std::size_t DrawListBuilder::AddState(DrawState const& state, bool isKnownSame) {
+std::size_t DrawListBuilder::AddState(RunState const& state, bool isKnownSame) {
     bool const isSame = !mList.states.empty() && (isKnownSame || mList.states.back() == state);
     if (!isSame) {
         UseTexture(state.target.texture);
@@ -122,7 +122,7 @@ void DrawListBuilder::Clear() {
 }
 
 std::uint64_t DrawListBuilder::GetCapacityBytes() const {
-    return mList.commands.capacity() * sizeof(Command) + mList.states.capacity() * sizeof(DrawState) +
+    return mList.commands.capacity() * sizeof(Command) + mList.states.capacity() * sizeof(RunState) +
            mList.uniforms.capacity() + mList.vertices.capacity() * sizeof(float);
 }
 

@@ -34,7 +34,7 @@ public:
 
     // Draws count of the vertices, from the first one on, which lie in this list. state is compared with the
     // last draw's unless isKnownSame; the program's values are copied if they changed.
-    void AddDraw(DrawState const& state, bool isKnownSame, ProgramState& program,
+    void AddDraw(RunState const& state, bool isKnownSame, ProgramState& program,
                  ListVertices const& vertices, int first, int count);
     void Add(ColorClear const& clear);
     void Add(DepthStencilClear const& clear);
@@ -63,7 +63,7 @@ private:
     static constexpr std::size_t kFullCommands = 1u << 13;
 
     bool IsUndrawnEnd(ListVertices const& vertices) const;
-    std::size_t AddState(DrawState const& state, bool isKnownSame);
+    std::size_t AddState(RunState const& state, bool isKnownSame);
     std::size_t AddValues(ProgramState& program);
     bool Extend(Run const& run);
     void UseTexture(DeviceName texture);

@@ -21,7 +21,7 @@ void Fill::Add(Recorder& recorder, TargetRef const& target, std::array<float, 4>
     if (!mProgram) Make(recorder);
     if (!mProgram->CanDraw()) return;
     mProgram->Set(mColor, color.data());
-    DrawState state;
+    RunState state;
     state.target = target;
     state.scissor = recorder.requested->GetScissor();
     state.depthStencil = recorder.requested->GetDepthStencil();

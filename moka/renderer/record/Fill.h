@@ -4,7 +4,7 @@
 // Thread: render thread.
 #pragma once
 
-#include "moka/renderer/device/DrawState.h"
+#include "moka/renderer/device/RunState.h"
 
 #include <array>
 #include <memory>

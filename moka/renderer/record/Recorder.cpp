@@ -72,7 +72,7 @@ bool Recorder::Draw(GraphicsObject& object, int format, PrimitiveType primitive,
         Flush();
         mDevice->RestoreHost(HostState::All);
     }
-    DrawState& state =
+    RunState& state =
         requested->Resolve(mActive ? mActive->GetRef() : GetCurrentTarget(), format, primitive);
     if (state.target.texture != 0 && program->GetSamplerCount() > 0) SampleCopyOfTarget(state);
     // Only now: a flush on the way here takes vertices out of the list.
@@ -90,7 +90,7 @@ TargetRef Recorder::GetCurrentTarget() {
 }
 
 // Sampling the texture that is drawn into is undefined: drivers show the old texels, the new ones, or neither.
-void Recorder::SampleCopyOfTarget(DrawState& state) {
+void Recorder::SampleCopyOfTarget(RunState& state) {
     for (TextureRef& texture : state.textures) {
         if (texture.texture != state.target.texture) continue;
         bool const fits = mTargetCopy && mTargetCopy->GetWidth() == state.target.width &&

@@ -124,7 +124,7 @@ private:
     void Prepare();
     void Delete(Dropped const& dropped);
     void DeleteDropped();
-    void SampleCopyOfTarget(DrawState& state);
+    void SampleCopyOfTarget(RunState& state);
     void CommitStates();
 
     std::unique_ptr<Device> mDevice;

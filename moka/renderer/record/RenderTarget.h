@@ -2,7 +2,7 @@
 #pragma once
 
 #include "moka/renderer/IRenderTarget.h"
-#include "moka/renderer/device/DrawState.h"
+#include "moka/renderer/device/RunState.h"
 
 #include <memory>
 

@@ -68,7 +68,7 @@ void RequestedState::SetTexture(int unit, std::shared_ptr<TextureStorage> const&
     mUnits[static_cast<std::size_t>(unit)] = {storage, sampling};
 }
 
-DrawState& RequestedState::Resolve(TargetRef const& target, int format, PrimitiveType primitive) {
+RunState& RequestedState::Resolve(TargetRef const& target, int format, PrimitiveType primitive) {
     if (!mKnowsScissorTest || (mDraw.scissor.on && !mKnowsScissorRect)) GetScissor();
     DeviceName const program = mProgram->GetName();
     bool const isSame = mDraw.target == target && mDraw.format == format && mDraw.primitive == primitive &&
@@ -123,7 +123,7 @@ std::vector<TextureRef> const& RequestedState::GetTextures() {
 
 void RequestedState::Forget() {
     mKnowsScissorTest = mKnowsScissorRect = mKnowsBlend = mKnowsDepthStencil = false;
-    Change(mDraw.blend, DrawState::WithoutBlending());
+    Change(mDraw.blend, RunState::WithoutBlending());
     if (!mStencilClip) Change(mDraw.depthStencil, DepthStencilStateDescriptor(false, false));
 }
 

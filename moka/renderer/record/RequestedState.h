@@ -5,7 +5,7 @@
 // blending and the depth-stencil tests count as off, and a commit leaves unknown parts alone.
 #pragma once
 
-#include "moka/renderer/device/DrawState.h"
+#include "moka/renderer/device/RunState.h"
 
 #include <memory>
 #include <vector>
@@ -43,7 +43,7 @@ public:
     void SetTexture(int unit, std::shared_ptr<TextureStorage> const& storage, Sampling const& sampling);
 
     // The state of a draw onto target, with the textures that the program samples. Valid until the next call.
-    DrawState& Resolve(TargetRef const& target, int format, PrimitiveType primitive);
+    RunState& Resolve(TargetRef const& target, int format, PrimitiveType primitive);
     // Whether the state differs from the last draw's.
     bool IsChanged() const { return mChanged; }
     void SetChanged(bool changed) { mChanged = changed; }
@@ -72,7 +72,7 @@ private:
     void ResolveTextures();
 
     Device& mDevice;
-    DrawState mDraw;
+    RunState mDraw;
     std::shared_ptr<ProgramState> mProgram;
     std::vector<Unit> mUnits;
     std::vector<TextureRef> mBound;

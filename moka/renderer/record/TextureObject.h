@@ -2,7 +2,7 @@
 #pragma once
 
 #include "moka/renderer/ITextureObject.h"
-#include "moka/renderer/device/DrawState.h"
+#include "moka/renderer/device/RunState.h"
 
 #include <memory>
 #include <string>

@@ -6,7 +6,7 @@
 #pragma once
 
 #include "moka/renderer/PixelBuffer.h"
-#include "moka/renderer/device/DrawState.h"
+#include "moka/renderer/device/RunState.h"
 
 #include <memory>
 

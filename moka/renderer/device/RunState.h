@@ -1,4 +1,4 @@
-// DrawState.h: everything a draw depends on except its vertices and uniform values, as comparable values. GPU
+// RunState.h: everything a run of draws depends on except its vertices and uniform values, as comparable values. GPU
 // objects appear by the names that the device gave them.
 #pragma once
 
@@ -66,7 +66,7 @@ inline constexpr int kMaxSamplers = 4;
 // One for each sampler of the program, in the program's order; the rest is empty.
 using TextureRefs = std::array<TextureRef, kMaxSamplers>;
 
-struct DrawState {
+struct RunState {
     TargetRef target;
     ScissorState scissor;
     BlendStateDescriptor blend = WithoutBlending();
@@ -83,7 +83,7 @@ struct DrawState {
         return blend;
     }
 
-    friend bool operator==(DrawState const& a, DrawState const& b) {
+    friend bool operator==(RunState const& a, RunState const& b) {
         return a.target == b.target && a.scissor == b.scissor && a.blend == b.blend &&
                a.depthStencil == b.depthStencil && a.program == b.program && a.textures == b.textures &&
                a.format == b.format && a.primitive == b.primitive;
