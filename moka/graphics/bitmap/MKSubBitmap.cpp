@@ -109,40 +109,50 @@ void MKSubBitmap::updateBitmapRectRT(Rect const& r, void const* pixels, int stri
 
 unsigned int MKSubBitmap::GetPixel(Point const& p) {
     auto const read = detail::BlockingRead::Make();
-    PostSelf(&MKSubBitmap::getPixelRT, p, read, nullptr, nullptr);
+    PostSelf(&MKSubBitmap::getPixelRT, p, read);
     mMsgQueue->WaitForTasks();
     return detail::BlockingRead::GetPixel(read);
 }
 
-void MKSubBitmap::GetPixelAsync(Point const& p, void* userData, PixelCallback callback) {
-    PostSelf(&MKSubBitmap::getPixelRT, p, detail::BlockingRead::Ptr(), userData, callback);
-}
-
-void MKSubBitmap::getPixelRT(Point const& p, detail::BlockingRead::Ptr const& read, void* userData,
-                             PixelCallback callback) {
-    auto const self = RefPtr<MKSubBitmap>::Adopt(this);
+void MKSubBitmap::getPixelRT(Point const& p, RefPtr<detail::BlockingRead> const& read) {
     unsigned int const pixel = ReadPixel(p);
     if (read) read->Finish(pixel);
+    Unref();
+}
+
+void MKSubBitmap::GetPixelAsync(Point const& p, void* userData, PixelCallback callback) {
+    PostSelf(&MKSubBitmap::getPixelAsyncRT, p, userData, callback);
+}
+
+void MKSubBitmap::getPixelAsyncRT(Point const& p, void* userData, PixelCallback callback) {
+    auto const self = RefPtr<MKSubBitmap>::Adopt(this);
+    unsigned int const pixel = ReadPixel(p);
     if (callback) callback(pixel, userData);
 }
 
 void MKSubBitmap::GetBitmapData(Rect const& r, void* destination) {
     auto const read = detail::BlockingRead::Make();
-    bool const accepted = PostSelf(&MKSubBitmap::getBitmapDataRT, r, destination, read, nullptr, nullptr);
+    bool const accepted = PostSelf(&MKSubBitmap::getBitmapDataRT, r, destination, read);
     mMsgQueue->WaitForTasks();
     detail::BlockingRead::CheckFinished(read, accepted);
 }
 
-void MKSubBitmap::GetBitmapDataAsync(Rect const& r, void* destination, void* userData,
-                                     DataCallback callback) {
-    PostSelf(&MKSubBitmap::getBitmapDataRT, r, destination, detail::BlockingRead::Ptr(), userData, callback);
-}
-
-void MKSubBitmap::getBitmapDataRT(Rect const& r, void* destination, detail::BlockingRead::Ptr const& read,
-                                  void* userData, DataCallback callback) {
-    auto const self = RefPtr<MKSubBitmap>::Adopt(this);
+void MKSubBitmap::getBitmapDataRT(Rect const& r, void* destination,
+                                  RefPtr<detail::BlockingRead> const& read) {
     ReadBlock(r, destination);
     if (read) read->Finish(0);
+    Unref();
+}
+
+void MKSubBitmap::GetBitmapDataAsync(Rect const& r, void* destination, void* userData,
+                                     DataCallback callback) {
+    PostSelf(&MKSubBitmap::getBitmapDataAsyncRT, r, destination, userData, callback);
+}
+
+void MKSubBitmap::getBitmapDataAsyncRT(Rect const& r, void* destination, void* userData,
+                                       DataCallback callback) {
+    auto const self = RefPtr<MKSubBitmap>::Adopt(this);
+    ReadBlock(r, destination);
     if (callback) callback(r, destination, userData);
 }
 

@@ -59,10 +59,10 @@ private:
     void detachDepthBufferRT();
     void updateBitmapRT(void const* pixels, int stride);
     void updateBitmapRectRT(Rect const& r, void const* pixels, int stride);
-    void getPixelRT(Point const& p, RefPtr<detail::BlockingRead> const& read, void* userData,
-                    PixelCallback callback);
-    void getBitmapDataRT(Rect const& r, void* destination, RefPtr<detail::BlockingRead> const& read,
-                         void* userData, DataCallback callback);
+    void getPixelRT(Point const& p, RefPtr<detail::BlockingRead> const& read);
+    void getPixelAsyncRT(Point const& p, void* userData, PixelCallback callback);
+    void getBitmapDataRT(Rect const& r, void* destination, RefPtr<detail::BlockingRead> const& read);
+    void getBitmapDataAsyncRT(Rect const& r, void* destination, void* userData, DataCallback callback);
     void setTagRT(char const* tag);
     void copyTextureRT(MKSubBitmapBase* target);
 
