@@ -1,7 +1,7 @@
 #include "moka/graphics/drawable/CustomDrawable.h"
 
 #include "moka/graphics/bitmap/IMKBitmapReadable.h"
-#include "moka/graphics/drawable/DrawState.h"
+#include "moka/graphics/drawable/DrawableState.h"
 #include "moka/graphics/drawable/Drawing.h"
 #include "moka/graphics/drawable/MKGraphicsUtil.h"
 #include "moka/graphics/drawable/ShaderPtr.h"
@@ -26,7 +26,7 @@ struct CustomDrawable<Shader>::Objects {
     }
 
     RendererPtr<IGraphicsObject> graphics;
-    DrawState state;
+    DrawableState state;
     ShaderPtr<Shader> shader;
 };
 

@@ -13,7 +13,7 @@
 #include "moka/base/RefPtr.h"
 #include "moka/graphics/bitmap/IMKBitmap.h"
 #include "moka/graphics/canvas/MKPaint.h"
-#include "moka/graphics/drawable/DrawState.h"
+#include "moka/graphics/drawable/DrawableState.h"
 #include "moka/graphics/drawable/RendererPtr.h"
 #include "moka/graphics/drawable/ShaderPtr.h"
 #include "moka/graphics/math/Matrix4.h"
@@ -58,7 +58,7 @@ private:
     detail::ShaderPtr<MKBitmapShader> mPlainShader; // or
     detail::ShaderPtr<MKBitmapShaderColorClamp> mClampShader; // on the one GPU that needs it
     detail::ShaderPtr<MKBitmapAdvancedBlendingShader> mAdvancedShader;
-    detail::DrawState mState;
+    detail::DrawableState mState;
 };
 
 } // namespace Moka

@@ -9,7 +9,7 @@
 #include "moka/base/NonAssignable.h"
 #include "moka/base/Point.h"
 #include "moka/graphics/canvas/MKPaint.h"
-#include "moka/graphics/drawable/DrawState.h"
+#include "moka/graphics/drawable/DrawableState.h"
 #include "moka/graphics/drawable/RendererPtr.h"
 #include "moka/graphics/drawable/ShaderPtr.h"
 #include "moka/graphics/math/Matrix4.h"
@@ -30,7 +30,7 @@ public:
 
 private:
     detail::RendererPtr<IGraphicsObject> mGraphics;
-    detail::DrawState mState;
+    detail::DrawableState mState;
     detail::ShaderPtr<MKCircleShader> mShader;
 };
 

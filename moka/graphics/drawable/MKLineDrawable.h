@@ -10,7 +10,7 @@
 #include "moka/base/NonAssignable.h"
 #include "moka/base/Point.h"
 #include "moka/graphics/canvas/MKPaint.h"
-#include "moka/graphics/drawable/DrawState.h"
+#include "moka/graphics/drawable/DrawableState.h"
 #include "moka/graphics/drawable/RendererPtr.h"
 #include "moka/graphics/drawable/ShaderPtr.h"
 #include "moka/graphics/math/Matrix4.h"
@@ -46,7 +46,7 @@ private:
                             MKPaint const& paint);
 
     detail::RendererPtr<IGraphicsObject> mLineGraphics;
-    detail::DrawState mState;
+    detail::DrawableState mState;
     detail::RendererPtr<IGraphicsObject> mSimpleGraphics;
     detail::ShaderPtr<MKLineShader> mLineShader;
     detail::ShaderPtr<MKRectShader> mRectShader;

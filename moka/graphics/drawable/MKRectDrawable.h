@@ -10,7 +10,7 @@
 #include "moka/base/NonAssignable.h"
 #include "moka/base/Rect.h"
 #include "moka/graphics/canvas/MKPaint.h"
-#include "moka/graphics/drawable/DrawState.h"
+#include "moka/graphics/drawable/DrawableState.h"
 #include "moka/graphics/drawable/RendererPtr.h"
 #include "moka/graphics/drawable/ShaderPtr.h"
 #include "moka/graphics/math/Matrix4.h"
@@ -31,7 +31,7 @@ public:
 
 private:
     detail::RendererPtr<IGraphicsObject> mGraphics;
-    detail::DrawState mState;
+    detail::DrawableState mState;
     detail::ShaderPtr<MKRectShader> mShader;
 };
 

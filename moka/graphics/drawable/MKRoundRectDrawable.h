@@ -9,7 +9,7 @@
 #include "moka/base/NonAssignable.h"
 #include "moka/base/Rect.h"
 #include "moka/graphics/canvas/MKPaint.h"
-#include "moka/graphics/drawable/DrawState.h"
+#include "moka/graphics/drawable/DrawableState.h"
 #include "moka/graphics/drawable/RendererPtr.h"
 #include "moka/graphics/drawable/ShaderPtr.h"
 #include "moka/graphics/math/Matrix4.h"
@@ -41,7 +41,7 @@ private:
 
     detail::RendererPtr<IGraphicsObject> mBodyGraphics;
     detail::RendererPtr<IGraphicsObject> mCornerGraphics;
-    detail::DrawState mState;
+    detail::DrawableState mState;
     detail::ShaderPtr<MKRoundRectShader> mBodyShader;
     detail::ShaderPtr<MKRoundRectRoundShader> mCornerShader;
 };

@@ -1,4 +1,4 @@
-// DrawState: the blend and the depth-stencil state that a drawable draws with, both its own.
+// DrawableState: the blend and the depth-stencil state that a drawable draws with, both its own.
 // Thread: render thread, except PostRelease.
 // Fails:  a state that the renderer refused makes it false; whoever draws asks first.
 #pragma once
@@ -12,10 +12,10 @@
 
 namespace Moka::detail {
 
-class DrawState {
+class DrawableState {
 public:
     // Blending, and neither a depth nor a stencil test.
-    DrawState();
+    DrawableState();
 
     explicit operator bool() const { return mBlend && mDepthStencil; }
 

@@ -1,4 +1,4 @@
-#include "moka/graphics/drawable/DrawState.h"
+#include "moka/graphics/drawable/DrawableState.h"
 
 #include "moka/graphics/drawable/MKGraphicsUtil.h"
 #include "moka/renderer/RendererFactory.h"
@@ -7,22 +7,22 @@
 
 namespace Moka::detail {
 
-DrawState::DrawState()
+DrawableState::DrawableState()
     : mBlend(RendererFactory::CreateBlendStateObject(BlendStateDescriptor(true))),
       mDepthStencil(RendererFactory::CreateDepthStencilState(DepthStencilStateDescriptor(false, false))) {}
 
-void DrawState::ApplyBlend(MKPaint::XFermode mode) {
+void DrawableState::ApplyBlend(MKPaint::XFermode mode) {
     if (mode != mMode) mBlend->SetDescriptor(MKGraphicsUtil::GetBlendingStateDescriptor(mode));
     mMode = mode;
     mBlend->Apply();
 }
 
-void DrawState::Release() {
+void DrawableState::Release() {
     mBlend.reset();
     mDepthStencil.reset();
 }
 
-void DrawState::PostRelease(IGLMsgQueue* queue) {
+void DrawableState::PostRelease(IGLMsgQueue* queue) {
     detail::PostRelease(queue, std::move(mBlend));
     detail::PostRelease(queue, std::move(mDepthStencil));
 }
