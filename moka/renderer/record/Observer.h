@@ -47,7 +47,7 @@ struct RequestValue {
     void const* object = nullptr;
 };
 
-struct Request {
+struct RendererRequest {
     ObjectKind kind;
     void const* object; // the interface pointer that the caller has; null for static functions
     char const* operation;
@@ -55,7 +55,7 @@ struct Request {
 };
 
 struct DrawRequest {
-    RequestedState const& state;
+    RequestedState& state;
     void const* graphics;
     PrimitiveType primitive;
     float const* vertices; // those that are drawn
@@ -66,7 +66,7 @@ struct DrawRequest {
 
 // Of a target, whichever is active.
 struct ClearRequest {
-    RequestedState const& state;
+    RequestedState& state;
     void const* target;
     bool clearsColor;
     std::array<float, 4> color;
@@ -82,7 +82,7 @@ public:
 
     // False makes the creation fail as if memory had run out.
     virtual bool MayCreate(ObjectKind kind) = 0;
-    virtual void OnRequest(Request const& request) = 0;
+    virtual void OnRequest(RendererRequest const& request) = 0;
     // A handle of program sets a value of the type.
     virtual void OnValue(void const* program, char const* name, BindingType type, void const* value) = 0;
     // The vertices are count times floatsPerVertex floats, null when there are none.

@@ -28,7 +28,7 @@ protected:
             RefPtr<IMKBitmap>::Adopt(MKGraphicsFactory::CreateBitmap(&queue, 8, 4, nullptr, false, 0, false));
         readable = bitmap->GetBitmapReadable();
         drawable.emplace(&queue);
-        RecordingRenderer::TakeCalls();
+        RendererTrace::TakeCalls();
     }
     void TearDown() override {
         drawable.reset();
@@ -50,7 +50,7 @@ protected:
     // What was done to textures other than the bitmap's own, without their parameters.
     static std::vector<std::string> TakeTextureCalls() {
         std::vector<std::string> calls;
-        for (std::string const& call : RecordingRenderer::TakeCalls())
+        for (std::string const& call : RendererTrace::TakeCalls())
             if (call.rfind("texture", 0) == 0 && call.rfind("texture 1 ", 0) != 0 &&
                 call.find("SetParameter") == std::string::npos)
                 calls.push_back(call);
@@ -87,7 +87,7 @@ TEST_F(BitmapDrawableTest, TheCornersCarryTheCornersOfTheSource) {
                                        MKPaint()));
     EXPECT_TRUE(drawable->DrawBitmapsRT(readable, bounds, bounds, RectF(12, 21, 16, 23), &dsts, projection,
                                         MKPaint()));
-    for (RecordedDraw const& shifted : TakeDraws()) {
+    for (TracedDraw const& shifted : TakeDraws()) {
         EXPECT_THAT(VerticesOf(shifted).front(), ElementsAre(0, 0, 1, 0.25f, 0.25f));
         EXPECT_THAT(VerticesOf(shifted).back(), ElementsAre(5, 5, 1, (16.0f + 10.0f) / 8.0f, 0.75f));
     }
@@ -105,7 +105,7 @@ TEST_F(BitmapDrawableTest, ABatchIsTheSameVerticesInOneDraw) {
             expected.insert(expected.end(), one.begin(), one.end());
         }
         EXPECT_TRUE(DrawBatch(dsts, paint));
-        RecordedDraw const batch = TakeDraw();
+        TracedDraw const batch = TakeDraw();
         EXPECT_EQ(batch.count, antiAliased ? 90 : 18);
         EXPECT_EQ(batch.vertices, expected);
     }
@@ -119,9 +119,9 @@ TEST_F(BitmapDrawableTest, TheDrawUsesThePaintAndTheBitmapAndLeavesTheStencilAlo
     ForceStencil();
     EXPECT_TRUE(Draw(RectF(0, 0, 5, 5), paint));
     EXPECT_TRUE(DrawBatch({RectF(0, 0, 5, 5)}, paint));
-    std::vector<RecordedDraw> const draws = TakeDraws();
+    std::vector<TracedDraw> const draws = TakeDraws();
     EXPECT_THAT(draws, SizeIs(2));
-    for (RecordedDraw const& draw : draws) {
+    for (TracedDraw const& draw : draws) {
         ExpectCommonState(draw);
         EXPECT_TRUE(draw.state.depthStencil.IsStencil());
         EXPECT_EQ(draw.textures.at(0), "texture 1");
@@ -135,8 +135,8 @@ TEST_F(BitmapDrawableTest, EachAxisWrapsAsThePaintSaysAndAnUnknownModeLeavesItAl
         MKPaint paint;
         paint.SetTileMode(static_cast<MKPaint::TileMode>(x), static_cast<MKPaint::TileMode>(y));
         Draw(RectF(0, 0, 5, 5), paint);
-        return std::array<int, 2>{RecordingRenderer::GetParameter(texture, 0),
-                                  RecordingRenderer::GetParameter(texture, 1)};
+        return std::array<int, 2>{RendererTrace::GetParameter(texture, 0),
+                                  RendererTrace::GetParameter(texture, 1)};
     };
     EXPECT_THAT(wrap(2, 3), ElementsAre(3, 0));
     EXPECT_THAT(wrap(4, 0), ElementsAre(3, 1));
@@ -171,9 +171,9 @@ TEST_F(BitmapDrawableTest, WithoutACopyOfTheDestinationNothingIsDrawn) {
     paint.SetXFermode(MKPaint::Darken);
     for (float const size : {kNaN, kInfinity, -kInfinity, 3e9f, 0.0f, 0.5f, -5.0f})
         EXPECT_FALSE(Draw(RectF(0, 0, 5, 5), paint, RectF(0, 0, size, 10))) << size;
-    RecordingRenderer::FailCreations(ObjectKind::Texture);
+    RendererTrace::FailCreations(ObjectKind::kTexture);
     EXPECT_FALSE(Draw(RectF(0, 0, 5, 5), paint));
-    RecordingRenderer::StopFailing();
+    RendererTrace::StopFailing();
     EXPECT_THAT(TakeDraws(), IsEmpty());
     EXPECT_TRUE(Draw(RectF(0, 0, 5, 5), paint, RectF(0, 0, 20, 10)));
 }

@@ -46,7 +46,7 @@ TEST_F(PrimitivesTest, StylesAndWidthsDecideWhatIsDrawn) {
     };
     auto const takeCounts = [] {
         std::vector<int> counts;
-        for (RecordedDraw const& draw : TakeDraws()) counts.push_back(draw.count);
+        for (TracedDraw const& draw : TakeDraws()) counts.push_back(draw.count);
         return counts;
     };
     MKRectDrawable rect;
@@ -100,9 +100,9 @@ TEST_F(PrimitivesTest, ThePointsAreFreedUnlessTheLineIsTooThin) {
     drawable.DrawLineRT(PointF(), PointF(5, 5), projection, Paint(MKPaint::Fill, 0.9f, true));
     drawable.DrawSimpleLineRT(PointF(), PointF(5, 5), projection, Paint(MKPaint::Fill, 0.9f, true));
     drawable.DrawSimpleLinesRT(nullptr, projection, MKPaint());
-    RecordingRenderer::FailCreations(ObjectKind::GraphicsObject);
+    RendererTrace::FailCreations(ObjectKind::kGraphicsObject);
     MKLineDrawable refused;
-    RecordingRenderer::StopFailing();
+    RendererTrace::StopFailing();
     EXPECT_TRUE(isFreed(refused, 4, 1));
     EXPECT_THAT(TakeDraws(), IsEmpty());
 }
@@ -133,9 +133,9 @@ TEST_F(PrimitivesTest, EveryDrawAppliesThePaintAndItsOwnStates) {
     paint.SetLineWidth(2);
     ForceStencil();
     primitives.DrawAll(RectF(2, 2, 12, 12), 3, projection, paint);
-    std::vector<RecordedDraw> const draws = TakeDraws();
+    std::vector<TracedDraw> const draws = TakeDraws();
     EXPECT_THAT(draws, SizeIs(1 + 4 + 2 + 3));
-    for (RecordedDraw const& draw : draws) {
+    for (TracedDraw const& draw : draws) {
         ExpectCommonState(draw);
         EXPECT_FALSE(draw.state.depthStencil.IsStencil() || draw.state.depthStencil.IsDepth());
     }
