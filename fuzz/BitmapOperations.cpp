@@ -181,9 +181,7 @@ void TagBitmap(CanvasWorld& world) {
     slot.object->SetTag(world.input.Bool() ? tag.c_str() : slot.object->GetTag());
 }
 
-void FailACreation(CanvasWorld& world) {
-    Testing::RecordingRenderer::FailCreation(1 + world.input.Below(16));
-}
+void FailACreation(CanvasWorld& world) { Testing::RendererTrace::FailCreation(1 + world.input.Below(16)); }
 
 void RunQueue(CanvasWorld& world) { world.queue.RunAll(); }
 

@@ -1,4 +1,4 @@
-// Turns bytes into calls on bitmaps and canvases over the recording renderer: whatever they are, nothing is
+// Turns bytes into calls on bitmaps and canvases over the tracing renderer: whatever they are, nothing is
 // left, nothing is misused and no memory error happens.
 #include "fuzz/CanvasWorld.h"
 #include "moka/base/log/LogSink.h"

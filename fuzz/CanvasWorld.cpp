@@ -4,25 +4,25 @@
 
 namespace Moka::Fuzz {
 
-using Testing::RecordingRenderer;
+using Testing::RendererTrace;
 
 CanvasWorld::CanvasWorld(FuzzInput& bytes) : input(bytes) {
-    RecordingRenderer::Reset();
-    RecordingRenderer::SetMaxTextureSize(kMaxTexture);
-    RecordingRenderer::KeepRecords(false);
-    RecordingRenderer::DeclareRenderThread();
+    RendererTrace::Reset();
+    RendererTrace::SetMaxTextureSize(kMaxTexture);
+    RendererTrace::KeepRecords(false);
+    RendererTrace::DeclareRenderThread();
     RendererFactory::AttachContext();
-    RecordingRenderer::DeclareNoRenderThread();
-    queue.SetAroundRun([] { RecordingRenderer::DeclareRenderThread(); },
-                       [] { RecordingRenderer::DeclareNoRenderThread(); });
+    RendererTrace::DeclareNoRenderThread();
+    queue.SetAroundRun([] { RendererTrace::DeclareRenderThread(); },
+                       [] { RendererTrace::DeclareNoRenderThread(); });
 }
 
 CanvasWorld::~CanvasWorld() {
     DropAll();
     queue.RunAll();
-    for (std::string const& violation : RecordingRenderer::GetViolations()) Require(false, violation.c_str());
-    Require(RecordingRenderer::CountLiveObjects() == 0, "GPU objects are left");
-    RecordingRenderer::DeclareRenderThread();
+    for (std::string const& violation : RendererTrace::GetViolations()) Require(false, violation.c_str());
+    Require(RendererTrace::CountLiveObjects() == 0, "GPU objects are left");
+    RendererTrace::DeclareRenderThread();
     RendererFactory::DetachContext();
 }
 

@@ -1,5 +1,5 @@
 // CanvasWorld: the bitmaps, canvases and drawables that one fuzzer input makes, uses and drops, over the
-// recording renderer and a queue that runs when the input says so.
+// tracing renderer and a queue that runs when the input says so.
 // Owner:   everything made; the destructor gives it back, in the order the input ended with, runs the queue
 //          and requires that no GPU object is left and none was misused.
 // Thread:  one, which stands for the render thread while tasks run and while a render-thread object is used.
@@ -13,7 +13,7 @@
 #include "moka/graphics/canvas/IMKPenCanvas.h"
 #include "moka/graphics/drawable/IMKCustomDrawable.h"
 #include "tests/support/Queues.h"
-#include "tests/support/RecordingRenderer.h"
+#include "tests/support/RendererTrace.h"
 
 #include <array>
 #include <memory>
@@ -28,10 +28,10 @@ constexpr int kMaxSide = 200;
 class ThreadScope {
 public:
     explicit ThreadScope(bool onRenderThread) : mOn(onRenderThread) {
-        if (mOn) Testing::RecordingRenderer::DeclareRenderThread();
+        if (mOn) Testing::RendererTrace::DeclareRenderThread();
     }
     ~ThreadScope() {
-        if (mOn) Testing::RecordingRenderer::DeclareNoRenderThread();
+        if (mOn) Testing::RendererTrace::DeclareNoRenderThread();
     }
     ThreadScope(ThreadScope const&) = delete;
     ThreadScope& operator=(ThreadScope const&) = delete;

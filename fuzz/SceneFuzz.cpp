@@ -1,4 +1,4 @@
-// Reads bytes as a scene file and, where it is one of few operations, draws it over the recording renderer. A
+// Reads bytes as a scene file and, where it is one of few operations, draws it over the tracing renderer. A
 // text that is no scene is refused with a message of one line that begins with the file and a line of it.
 #include "fuzz/CanvasWorld.h"
 #include "moka/base/log/LogSink.h"

@@ -4,7 +4,7 @@
 #include "moka/graphics/bitmap/MKGraphicsFactory.h"
 #include "moka/graphics/canvas/IMKCanvas.h"
 #include "moka/renderer/RendererFactory.h"
-#include "tests/support/RecordingRenderer.h"
+#include "tests/support/RendererTrace.h"
 #include "tests/trust/Faults.h"
 #include "tests/trust/TrustFixture.h"
 
@@ -38,10 +38,10 @@ protected:
 class AllocationFaults : public FaultSweep {};
 
 TEST_P(AllocationFaults, AnObjectThatCannotBeMadeLeavesNothingBehind) {
-    int const alive = RecordingRenderer::CountLiveObjects();
+    int const alive = RendererTrace::CountLiveObjects();
     auto const objects = Faults::CountLive(Faults::Kind::Objects);
     Sweep(Faults::Kind::Objects, [&](bool) {
-        EXPECT_EQ(RecordingRenderer::CountLiveObjects(), alive);
+        EXPECT_EQ(RendererTrace::CountLiveObjects(), alive);
         EXPECT_EQ(Faults::CountLive(Faults::Kind::Objects), objects);
         // A class that memory ran out for has no shader from then on, by design: its drawables draw nothing
         // until the process ends. For the sweep it ends here, where no shader is in use.
@@ -52,11 +52,11 @@ TEST_P(AllocationFaults, AnObjectThatCannotBeMadeLeavesNothingBehind) {
 // The copies of what the caller gave, and the loader's books: a call that lacks memory for them did not happen, or
 // throws.
 TEST_P(AllocationFaults, ACallWithoutMemoryForItsCopiesLeavesNothingBehind) {
-    int const alive = RecordingRenderer::CountLiveObjects();
+    int const alive = RendererTrace::CountLiveObjects();
     auto const objects = Faults::CountLive(Faults::Kind::Objects);
     auto const tasks = Faults::CountLive(Faults::Kind::Tasks);
     Sweep(Faults::Kind::Throwing, [&](bool) {
-        EXPECT_EQ(RecordingRenderer::CountLiveObjects(), alive);
+        EXPECT_EQ(RendererTrace::CountLiveObjects(), alive);
         EXPECT_EQ(Faults::CountLive(Faults::Kind::Objects), objects);
         EXPECT_EQ(Faults::CountLive(Faults::Kind::Tasks), tasks);
     });
@@ -71,20 +71,20 @@ TEST_P(RequestFaults, ARequestThatCannotBeMadeIsARefusedOne) {
     auto const tasks = Faults::CountLive(Faults::Kind::Tasks);
     Sweep(Faults::Kind::Tasks, [&](bool failed) {
         EXPECT_EQ(Faults::CountLive(Faults::Kind::Tasks), tasks);
-        int const live = RecordingRenderer::CountLiveObjects();
+        int const live = RendererTrace::CountLiveObjects();
         auto const objects = Faults::CountLive(Faults::Kind::Objects);
         // A drawable that was never deleted keeps its shader in use, with all that was set in it.
         ForgetShaders();
         if (failed) return;
         RunScenario();
-        EXPECT_EQ(RecordingRenderer::CountLiveObjects(), live);
+        EXPECT_EQ(RendererTrace::CountLiveObjects(), live);
         EXPECT_EQ(Faults::CountLive(Faults::Kind::Objects), objects);
     });
 }
 
 // The containers of a canvas: what they have no memory for did not happen, and nobody sees an exception.
 TEST(ThrowingAllocationFaults, ALevelOrAClipThatDoesNotFitIsDropped) {
-    RecordingRenderer::Reset();
+    RendererTrace::Reset();
     ASSERT_TRUE(RendererFactory::AttachContext());
     HandPumpedQueue queue;
     {
@@ -104,9 +104,9 @@ TEST(ThrowingAllocationFaults, ALevelOrAClipThatDoesNotFitIsDropped) {
         canvas->Restore(level);
         EXPECT_TRUE(canvas->GetMatrix() == scaled);
         canvas->Clear(1, 1, 1, 1);
-        EXPECT_FALSE(RecordingRenderer::GetClears().back().state.scissorOn);
+        EXPECT_FALSE(RendererTrace::GetClears().back().state.scissorOn);
     }
-    EXPECT_EQ(RecordingRenderer::CountLiveObjects(), 0);
+    EXPECT_EQ(RendererTrace::CountLiveObjects(), 0);
     RendererFactory::DetachContext();
 }
 

@@ -1,5 +1,5 @@
 // Every creation of a renderer object fails in turn, once and for good.
-#include "tests/support/RecordingRenderer.h"
+#include "tests/support/RendererTrace.h"
 #include "tests/trust/Faults.h"
 #include "tests/trust/TrustFixture.h"
 
@@ -10,12 +10,12 @@ class CreationFaults : public TrustFixture {
 protected:
     // Those that FailCreation counts: all but programs.
     int CountCreations() {
-        RecordingRenderer::TakeCalls();
+        RendererTrace::TakeCalls();
         RunScenario();
         int count = 0;
-        for (RecordedCall const& call : RecordingRenderer::GetCalls())
+        for (TracedCall const& call : RendererTrace::GetCalls())
             if (call.operation == "Create" && call.object.rfind("program", 0) != 0) ++count;
-        RecordingRenderer::TakeCalls();
+        RendererTrace::TakeCalls();
         return count;
     }
 };
@@ -23,15 +23,15 @@ protected:
 TEST_P(CreationFaults, LeaveNothingBehindAndTheNextFrameRight) {
     std::vector<std::string> const undisturbed = TakeFrame();
     int const count = CountCreations();
-    int const alive = RecordingRenderer::CountLiveObjects();
+    int const alive = RendererTrace::CountLiveObjects();
     auto const objects = Faults::CountLive(Faults::Kind::Objects);
     for (bool const all : {false, true})
         for (int k = 1; k <= count + 1; ++k) {
             SCOPED_TRACE((all ? "all from " : "only ") + std::to_string(k) + " of " + std::to_string(count));
-            for (int n = k; n <= (all ? count + 1 : k); ++n) RecordingRenderer::FailCreation(n);
+            for (int n = k; n <= (all ? count + 1 : k); ++n) RendererTrace::FailCreation(n);
             RunScenario();
-            RecordingRenderer::StopFailing();
-            EXPECT_EQ(RecordingRenderer::CountLiveObjects(), alive);
+            RendererTrace::StopFailing();
+            EXPECT_EQ(RendererTrace::CountLiveObjects(), alive);
             EXPECT_EQ(Faults::CountLive(Faults::Kind::Objects), objects);
             ASSERT_EQ(TakeFrame(), undisturbed);
         }

@@ -9,7 +9,7 @@
 #include "moka/graphics/loader/MKBitmapLoader.h"
 #include "moka/renderer/RendererFactory.h"
 #include "tests/support/LogCapture.h"
-#include "tests/support/RecordingRenderer.h"
+#include "tests/support/RendererTrace.h"
 #include "tests/support/TestFiles.h"
 #include "tests/trust/Faults.h"
 #include "tests/trust/LeakLedger.h"
@@ -51,16 +51,16 @@ class RefusingLoaderTest : public ::testing::TestWithParam<int> {
 protected:
     void SetUp() override {
         MKBitmapFactory_UseNativeDecoder();
-        RecordingRenderer::Reset();
-        RecordingRenderer::KeepRecords(false);
+        RendererTrace::Reset();
+        RendererTrace::KeepRecords(false);
         ASSERT_TRUE(RendererFactory::AttachContext());
-        RecordingRenderer::DeclareNoRenderThread();
-        queue.SetAroundRun([] { RecordingRenderer::DeclareRenderThread(); },
-                           [] { RecordingRenderer::DeclareNoRenderThread(); });
+        RendererTrace::DeclareNoRenderThread();
+        queue.SetAroundRun([] { RendererTrace::DeclareRenderThread(); },
+                           [] { RendererTrace::DeclareNoRenderThread(); });
         ASSERT_TRUE(MKBitmapLoader::startEventLoopBySelf());
     }
     void TearDown() override {
-        RecordingRenderer::DeclareRenderThread();
+        RendererTrace::DeclareRenderThread();
         RendererFactory::DetachContext();
     }
 
@@ -138,14 +138,14 @@ TEST_P(RefusingLoaderTest, EveryRequestCallsBackOnceButForRefusedReadBacks) {
     EXPECT_EQ(queue.CountOffered(), std::int64_t{queue.GetPostedCount()} + queue.GetRefusedCount());
     EXPECT_EQ(queue.GetLedger().CountEntries(), queue.GetRefusedCount());
     queue.SetReliable(true);
-    RecordingRenderer::DeclareRenderThread();
+    RendererTrace::DeclareRenderThread();
     queue.GetLedger().Settle();
-    RecordingRenderer::DeclareNoRenderThread();
+    RendererTrace::DeclareNoRenderThread();
     queue.RunAll();
-    EXPECT_EQ(RecordingRenderer::CountLiveObjects(), 0);
+    EXPECT_EQ(RendererTrace::CountLiveObjects(), 0);
     EXPECT_EQ(Faults::CountLive(Faults::Kind::Tasks), 0);
     EXPECT_EQ(Faults::CountWrongFrees(), 0);
-    EXPECT_TRUE(RecordingRenderer::GetViolations().empty());
+    EXPECT_TRUE(RendererTrace::GetViolations().empty());
 }
 
 INSTANTIATE_TEST_SUITE_P(PerCent, RefusingLoaderTest, ::testing::Values(1, 10, 50));

@@ -4,7 +4,7 @@
 
 #include "moka/renderer/RendererFactory.h"
 #include "tests/support/LogCapture.h"
-#include "tests/support/RecordingRenderer.h"
+#include "tests/support/RendererTrace.h"
 #include "tests/trust/Faults.h"
 #include "tests/trust/MixedWork.h"
 
@@ -22,16 +22,16 @@ constexpr std::int64_t kPostsBetweenSettlements = 50000;
 class RefusingQueueTest : public ::testing::TestWithParam<int> {
 protected:
     void SetUp() override {
-        RecordingRenderer::Reset();
-        RecordingRenderer::KeepRecords(false);
-        RecordingRenderer::SetMaxTextureSize(MixedWork::kSide);
+        RendererTrace::Reset();
+        RendererTrace::KeepRecords(false);
+        RendererTrace::SetMaxTextureSize(MixedWork::kSide);
         ASSERT_TRUE(RendererFactory::AttachContext());
-        RecordingRenderer::DeclareNoRenderThread();
-        queue.SetAroundRun([] { RecordingRenderer::DeclareRenderThread(); },
-                           [] { RecordingRenderer::DeclareNoRenderThread(); });
+        RendererTrace::DeclareNoRenderThread();
+        queue.SetAroundRun([] { RendererTrace::DeclareRenderThread(); },
+                           [] { RendererTrace::DeclareNoRenderThread(); });
     }
     void TearDown() override {
-        RecordingRenderer::DeclareRenderThread();
+        RendererTrace::DeclareRenderThread();
         RendererFactory::DetachContext();
     }
 
@@ -39,9 +39,9 @@ protected:
     void SettleTheBook() {
         queue.RunAll();
         queue.SetReliable(true);
-        RecordingRenderer::DeclareRenderThread();
+        RendererTrace::DeclareRenderThread();
         queue.GetLedger().Settle();
-        RecordingRenderer::DeclareNoRenderThread();
+        RendererTrace::DeclareNoRenderThread();
         queue.RunAll();
         queue.SetReliable(false);
     }
@@ -65,9 +65,9 @@ TEST_P(RefusingQueueTest, TheBookBalancesOverAMillionPosts) {
         work.DropAll();
         queue.RunAll();
         leaked += queue.GetLedger().CountEntries();
-        EXPECT_GT(RecordingRenderer::CountLiveObjects(), 0); // before it is settled
+        EXPECT_GT(RendererTrace::CountLiveObjects(), 0); // before it is settled
         SettleTheBook();
-        EXPECT_EQ(RecordingRenderer::CountLiveObjects(), 0);
+        EXPECT_EQ(RendererTrace::CountLiveObjects(), 0);
         EXPECT_EQ(Faults::CountLive(Faults::Kind::Objects), objects);
         EXPECT_EQ(Faults::CountLive(Faults::Kind::Tasks), tasks);
     }
@@ -78,7 +78,7 @@ TEST_P(RefusingQueueTest, TheBookBalancesOverAMillionPosts) {
     EXPECT_EQ(Faults::CountWrongFrees(), 0);
     EXPECT_EQ(leaked, queue.GetRefusedCount());
     EXPECT_GE(queue.GetLedger().GetKinds().size(), 30u); // the work is mixed
-    std::vector<std::string> const violations = RecordingRenderer::GetViolations();
+    std::vector<std::string> const violations = RendererTrace::GetViolations();
     EXPECT_TRUE(violations.empty()) << violations.size() << ", " << violations.front();
     RecordProperty("refused", queue.GetRefusedCount());
 }

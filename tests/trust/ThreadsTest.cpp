@@ -8,9 +8,9 @@
 #include "moka/host/TaskQueue.h"
 #include "moka/renderer/RendererFactory.h"
 #include "tests/support/LogCapture.h"
-#include "tests/support/RecordingRenderer.h"
-#include "tests/support/RecordingThread.h"
+#include "tests/support/RendererTrace.h"
 #include "tests/support/TestFiles.h"
+#include "tests/support/TracingThread.h"
 #include "tests/trust/MixedWork.h"
 
 #include <atomic>
@@ -87,7 +87,7 @@ protected:
 
 TEST_F(ThreadsTest, RandomCallersTheLoaderAndHandlersShareOneRenderThread) {
     {
-        RecordingThread queue(MixedWork::kSide);
+        TracingThread queue(MixedWork::kSide);
         auto const shared = RefPtr<IMKBitmap>::Adopt(MKGraphicsFactory::CreateBitmap(
             &queue, MixedWork::kSide, MixedWork::kHeight, nullptr, false, 1, false));
         std::vector<std::thread> threads;
@@ -103,8 +103,8 @@ TEST_F(ThreadsTest, RandomCallersTheLoaderAndHandlersShareOneRenderThread) {
         MKBitmapLoader::WaitForAllSaveRequestsToEnd(&queue);
     }
     EXPECT_EQ(called, 4 * kLoads);
-    EXPECT_EQ(RecordingRenderer::CountLiveObjects(), 0);
-    EXPECT_TRUE(RecordingRenderer::GetViolations().empty());
+    EXPECT_EQ(RendererTrace::CountLiveObjects(), 0);
+    EXPECT_TRUE(RendererTrace::GetViolations().empty());
 }
 
 } // namespace

@@ -5,7 +5,7 @@
 #include "moka/graphics/drawable/ShaderManager.h"
 #include "moka/graphics/drawable/Shaders.h"
 #include "moka/renderer/RendererFactory.h"
-#include "tests/support/RecordingRenderer.h"
+#include "tests/support/RendererTrace.h"
 #include "tests/support/TestImages.h"
 #include "tests/trust/Faults.h"
 
@@ -20,9 +20,9 @@ namespace {
 
 class FrameText {
 public:
-    std::string Describe(RecordedEvent const& event) {
-        if (auto const* const draw = std::get_if<RecordedDraw>(&event)) return Describe(*draw);
-        return Describe(std::get<RecordedClear>(event));
+    std::string Describe(TracedEvent const& event) {
+        if (auto const* const draw = std::get_if<TracedDraw>(&event)) return Describe(*draw);
+        return Describe(std::get<TracedClear>(event));
     }
 
 private:
@@ -40,7 +40,7 @@ private:
              << state.scissor.height;
     }
 
-    std::string Describe(RecordedDraw const& draw) {
+    std::string Describe(TracedDraw const& draw) {
         std::ostringstream text;
         text << draw.shader << " into " << Name(draw.target) << " with " << Name(draw.buffer) << " count "
              << draw.count;
@@ -63,7 +63,7 @@ private:
         return text.str();
     }
 
-    std::string Describe(RecordedClear const& clear) {
+    std::string Describe(TracedClear const& clear) {
         std::ostringstream text;
         text << "clear of " << Name(clear.target);
         AddScissor(text, clear.state);
@@ -103,19 +103,19 @@ void TrustFixture::SetUp() {
     SetLogSink([](LogLine const&) {}); // error lines are expected
     MKBitmapFactory_UseNativeDecoder();
     ASSERT_TRUE(SaveImage(MakeAlphaPattern(20, 90), folder.Path("picture.png")));
-    RecordingRenderer::Reset();
-    RecordingRenderer::SetMaxTextureSize(kMaxSide);
+    RendererTrace::Reset();
+    RendererTrace::SetMaxTextureSize(kMaxSide);
     ASSERT_TRUE(RendererFactory::AttachContext());
-    RecordingRenderer::DeclareNoRenderThread();
-    queue.SetAroundRun([] { RecordingRenderer::DeclareRenderThread(); },
-                       [] { RecordingRenderer::DeclareNoRenderThread(); });
+    RendererTrace::DeclareNoRenderThread();
+    queue.SetAroundRun([] { RendererTrace::DeclareRenderThread(); },
+                       [] { RendererTrace::DeclareNoRenderThread(); });
     RunScenario(); // whatever is made once and kept is made now
 }
 
 void TrustFixture::TearDown() {
-    for (std::string const& violation : RecordingRenderer::GetViolations()) ADD_FAILURE() << violation;
+    for (std::string const& violation : RendererTrace::GetViolations()) ADD_FAILURE() << violation;
     ForgetShaders(); // those that a leaked drawable holds die with the renderer's next reset
-    RecordingRenderer::DeclareRenderThread();
+    RendererTrace::DeclareRenderThread();
     RendererFactory::DetachContext();
     for (std::string const& name : folder.List())
         EXPECT_EQ(name.find(".tmp"), std::string::npos) << "a save left its temporary file " << name;
@@ -137,12 +137,12 @@ void TrustFixture::RunScenario() {
 }
 
 std::vector<std::string> TrustFixture::TakeFrame() {
-    RecordingRenderer::TakeEvents();
+    RendererTrace::TakeEvents();
     RunScenario();
     FrameText text;
     std::vector<std::string> frame;
-    for (RecordedEvent const& event : RecordingRenderer::TakeEvents()) frame.push_back(text.Describe(event));
-    RecordingRenderer::TakeCalls();
+    for (TracedEvent const& event : RendererTrace::TakeEvents()) frame.push_back(text.Describe(event));
+    RendererTrace::TakeCalls();
     return frame;
 }
 

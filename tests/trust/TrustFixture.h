@@ -1,4 +1,4 @@
-// TrustFixture: scenarios over the recording renderer, on one thread that stands for both sides. Programs
+// TrustFixture: scenarios over the tracing renderer, on one thread that stands for both sides. Programs
 // are counted with the other objects, so a run that balances leaves nothing alive at all.
 #pragma once
 
@@ -13,7 +13,7 @@
 namespace Moka::Testing {
 
 // Goes on after a task that threw, as a render thread does. Its own containers, and those of whoever a task calls,
-// never lack memory: among them are the books of the recording renderer.
+// never lack memory: among them are the books of the tracing renderer.
 class SurvivingQueue final : public HandPumpedQueue {
 public:
     bool Post(ITask* task) override;

@@ -140,6 +140,11 @@ void NullDevice::Submit(DrawList const& list) {
     mCounters.vertexBytes += list.vertices.size() * sizeof(float);
 }
 
+void NullDevice::Commit(StateCommit const& commit) {
+    if (commit.scissorTest) mScissor.on = *commit.scissorTest;
+    if (commit.scissorRect) mScissor.rect = *commit.scissorRect;
+}
+
 NullImage& NullDevice::GetImage(TargetRef const& target) {
     if (target.texture != 0) return mTextures[target.texture];
     if (target.width > mHost.width || target.height > mHost.height) {

@@ -42,25 +42,25 @@ public:
     void DeleteProgram(DeviceName program) override;
     int AddVertexFormat(VertexDescriptor const& descriptor) override;
     void Submit(DrawList const& list) override;
-    void Commit(StateCommit const&) override {}
+    void Commit(StateCommit const& commit) override;
     void RestoreHost(HostState) override {}
     void InvalidateState() override {}
     DeviceName GetHostFrameBuffer() override { return 0; }
-    bool QueryScissorTest() override { return false; }
-    ScissorRect QueryScissorRect() override { return {}; }
+    bool QueryScissorTest() override { return mScissor.on; }
+    ScissorRect QueryScissorRect() override { return mScissor.rect; }
     void LabelTexture(DeviceName, char const*) override {}
     void DeleteSamplers() override {}
 
 protected:
     // The texture's image, or the one host frame buffer that there is, which grows with its targets.
     NullImage& GetImage(TargetRef const& target);
+    virtual void Execute(Discard const& discard);
 
 private:
     void Execute(Run const& run);
     void Execute(ColorClear const& clear);
     void Execute(DepthStencilClear const& clear);
     void Execute(TextureClear const& clear);
-    void Execute(Discard const& discard);
     void Execute(TargetCopy const& copy);
     void Execute(TextureDraw const& draw);
     void Copy(TargetRef const& from, TargetRef const& to, int width, int height);
@@ -69,6 +69,7 @@ private:
     DeviceName mLastName = 0; // of any kind
     std::unordered_map<DeviceName, NullImage> mTextures;
     NullImage mHost;
+    ScissorState mScissor; // as committed, which is all that a query can find
     std::vector<VertexDescriptor> mFormats;
 };
 

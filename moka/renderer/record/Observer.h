@@ -55,7 +55,7 @@ struct RendererRequest {
 };
 
 struct DrawRequest {
-    RequestedState const& state;
+    RequestedState& state;
     void const* graphics;
     PrimitiveType primitive;
     float const* vertices; // those that are drawn
@@ -66,7 +66,7 @@ struct DrawRequest {
 
 // Of a target, whichever is active.
 struct ClearRequest {
-    RequestedState const& state;
+    RequestedState& state;
     void const* target;
     bool clearsColor;
     std::array<float, 4> color;

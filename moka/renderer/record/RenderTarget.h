@@ -33,6 +33,8 @@ public:
     // As commands name it, with the depth-stencil buffer attached now.
     TargetRef const& GetRef() const { return mRef; }
     std::shared_ptr<FrameBuffer> const& GetFrameBuffer() const { return mFrameBuffer; }
+    // The buffer that is attached, or null.
+    DepthStencilBuffer const* GetDepthStencil() const { return mDepthStencil; }
     // No depth-stencil buffer afterwards. Commands in the list name the one they were made with.
     void ForgetDepthStencil();
 

@@ -163,8 +163,7 @@ ITextureObject* RendererFactory::CreateTextureObject(TextureDescriptor const& de
         auto* const texture = new TextureObject(std::move(storage));
         for (int i = 0; i < parameterCount; ++i) texture->Store(parameters[i].id, parameters[i].value);
         Observe(ObjectKind::kTexture, static_cast<Result>(texture), "Create", descriptor.width,
-                descriptor.height, descriptor.flag, static_cast<void const*>(descriptor.model),
-                source.pixels ? 1 : 0, source.x, source.y, source.rowLength);
+                descriptor.height);
         return texture;
     });
 }

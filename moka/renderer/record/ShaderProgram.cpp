@@ -111,9 +111,10 @@ void ShaderProgram::Release() {
 
 IParameterBinding* ShaderProgram::GetParameter(char const* name) {
     IShaderProgram* const self = this;
-    Observe(kKind, self, "GetParameter", name ? name : "null");
     try {
-        return new Parameter(mState, self, mState->AddHandle(name));
+        auto* const parameter = new Parameter(mState, self, mState->AddHandle(name));
+        Observe(kKind, self, "GetParameter", name ? name : "null", parameter->GetType());
+        return parameter;
     } catch (std::bad_alloc const&) {
         return InertParameter::Get();
     }

@@ -1,4 +1,4 @@
-// BitmapFixture: bitmaps over the recording renderer and a hand-pumped queue. The test's thread stands for
+// BitmapFixture: bitmaps over the tracing renderer and a hand-pumped queue. The test's thread stands for
 // the render thread only while tasks run, so GPU work that should have been posted is a violation. Every test
 // ends with nothing alive and nothing misused.
 #pragma once
@@ -10,7 +10,7 @@
 #include "moka/renderer/ITextureObject.h"
 #include "moka/renderer/RendererFactory.h"
 #include "tests/support/Queues.h"
-#include "tests/support/RecordingRenderer.h"
+#include "tests/support/RendererTrace.h"
 #include "tests/support/TestImages.h"
 
 #include <cstring>
@@ -70,11 +70,11 @@ protected:
     static constexpr int kMaxSide = 64;
 
     void SetUp() override {
-        RecordingRenderer::Reset();
-        RecordingRenderer::SetMaxTextureSize(kMaxSide);
+        RendererTrace::Reset();
+        RendererTrace::SetMaxTextureSize(kMaxSide);
         ASSERT_TRUE(RendererFactory::AttachContext());
-        mAliveBefore = RecordingRenderer::CountLiveObjects(); // other tests leak on purpose
-        RecordingRenderer::DeclareNoRenderThread();
+        mAliveBefore = RendererTrace::CountLiveObjects(); // other tests leak on purpose
+        RendererTrace::DeclareNoRenderThread();
         RunOnRenderThread(queue);
         RunOnRenderThread(picky);
         RunOnRenderThread(hasty);
@@ -84,15 +84,15 @@ protected:
         queue.RunAll();
         picky.RunAll();
         hasty.RunAll();
-        EXPECT_EQ(RecordingRenderer::CountLiveObjects(), mAliveBefore);
-        for (std::string const& violation : RecordingRenderer::GetViolations()) ADD_FAILURE() << violation;
-        RecordingRenderer::DeclareRenderThread();
+        EXPECT_EQ(RendererTrace::CountLiveObjects(), mAliveBefore);
+        for (std::string const& violation : RendererTrace::GetViolations()) ADD_FAILURE() << violation;
+        RendererTrace::DeclareRenderThread();
         RendererFactory::DetachContext();
     }
 
     static void RunOnRenderThread(HandPumpedQueue& any) {
-        any.SetAroundRun([] { RecordingRenderer::DeclareRenderThread(); },
-                         [] { RecordingRenderer::DeclareNoRenderThread(); });
+        any.SetAroundRun([] { RendererTrace::DeclareRenderThread(); },
+                         [] { RendererTrace::DeclareNoRenderThread(); });
     }
 
     IMKBitmap* Create(int width, int height, void const* pixels = nullptr) {
@@ -117,8 +117,8 @@ protected:
 
     // On the render thread, which the test's thread then is until the end of the scope.
     struct OnRenderThread {
-        OnRenderThread() { RecordingRenderer::DeclareRenderThread(); }
-        ~OnRenderThread() { RecordingRenderer::DeclareNoRenderThread(); }
+        OnRenderThread() { RendererTrace::DeclareRenderThread(); }
+        ~OnRenderThread() { RendererTrace::DeclareNoRenderThread(); }
         OnRenderThread(OnRenderThread const&) = delete;
         OnRenderThread& operator=(OnRenderThread const&) = delete;
     };

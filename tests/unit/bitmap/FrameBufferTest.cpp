@@ -9,13 +9,13 @@ class FrameBuffer : public BitmapFixture {
 protected:
     void SetUp() override {
         BitmapFixture::SetUp();
-        RecordingRenderer::DeclareRenderThread();
+        RendererTrace::DeclareRenderThread();
         strip = RefPtr<MKSubBitmapRT>::Adopt(
             new MKSubBitmapRT(&queue, 0, Rect(0, 0, 4, 4), 4, 4, nullptr, false));
     }
     void TearDown() override {
         strip = {};
-        RecordingRenderer::DeclareNoRenderThread();
+        RendererTrace::DeclareNoRenderThread();
         BitmapFixture::TearDown();
     }
 
@@ -50,8 +50,8 @@ TEST_F(FrameBuffer, DepthAndStencilShareOneBufferAndOneCount) {
     EXPECT_EQ(Buffers(), 1);
     strip->DetachStencilBufferRT(false);
     EXPECT_EQ(Buffers(), 0);
-    EXPECT_EQ(RecordingRenderer::CountCalls("AttachDepthStencil"), 1);
-    EXPECT_EQ(RecordingRenderer::CountCalls("DetachDepthStencil"), 1);
+    EXPECT_EQ(RendererTrace::CountCalls("AttachDepthStencil"), 1);
+    EXPECT_EQ(RendererTrace::CountCalls("DetachDepthStencil"), 1);
 }
 
 // After that the request is still counted: another one finds no buffer, and the last detach has nothing to
@@ -71,15 +71,15 @@ TEST_F(FrameBuffer, TheLastCanvasTakesTheBufferAlongAndOpenRequestsStayCounted) 
     strip->ReleaseFrameBufferRT(false);
     strip->CreateFrameBufferRT(false);
     strip = {}; // with the request open and its buffer gone
-    EXPECT_EQ(RecordingRenderer::CountLiveObjects(), 0);
+    EXPECT_EQ(RendererTrace::CountLiveObjects(), 0);
 }
 
 TEST_F(FrameBuffer, DiscardFlagsAreTheTwoBits) {
     strip->CreateFrameBufferRT(false);
-    RecordingRenderer::TakeCalls();
+    RendererTrace::TakeCalls();
     for (int discard : {0, 1, 2, 3})
         strip->DeactivateFrameBufferRT(false, static_cast<DiscardFramebufferType>(discard));
-    EXPECT_EQ(RecordingRenderer::TakeCalls(),
+    EXPECT_EQ(RendererTrace::TakeCalls(),
               (std::vector<std::string>{"target 1 Deactivate 0 0", "target 1 Deactivate 1 0",
                                         "target 1 Deactivate 0 1", "target 1 Deactivate 1 1"}));
 }

@@ -34,7 +34,7 @@ TEST_F(Factory, LoadingHoldsOneDecodedCopyUntilItIsUploaded) {
     constexpr int kWidth = 600;
     constexpr int kHeight = 400;
     constexpr std::size_t kBytes = std::size_t{kWidth} * kHeight * 4;
-    RecordingRenderer::SetMaxTextureSize(kWidth);
+    RendererTrace::SetMaxTextureSize(kWidth);
     for (char const* name : {"m.mki", "m.png", "m.webp", "m.jpg"}) {
         String const path = Save(name, kWidth, kHeight);
         std::size_t const before = ArrayMemory::GetLive();

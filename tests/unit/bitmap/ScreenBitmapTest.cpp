@@ -59,7 +59,7 @@ TEST_F(ScreenBitmap, StandsForTheFrameBufferAskedForAndClonesForTheOther) {
     EXPECT_EQ(queue.GetPendingCount(), 1) << "a clone is caller-side";
     queue.RunAll();
     std::vector<std::string> created;
-    for (RecordedCall const& call : RecordingRenderer::GetCalls())
+    for (TracedCall const& call : RendererTrace::GetCalls())
         if (call.operation == "Create") created.push_back(call.arguments.substr(0, call.arguments.find(' ')));
     EXPECT_THAT(created, ElementsAre("default", "current", "current", "current", "default"));
     EXPECT_EQ(CountOf(usual.Get()), 1);
@@ -161,7 +161,7 @@ TEST_F(ScreenBitmap, ActivationIsPostedDeactivationIsNotAndAttachingOnlyCounts) 
     EXPECT_EQ(CountOf(screen.Get()), 3);
     queue.RunAll();
     EXPECT_EQ(CountOf(screen.Get()), 1);
-    EXPECT_EQ(RecordingRenderer::GetActiveTarget(), "target 1");
+    EXPECT_EQ(RendererTrace::GetActiveTarget(), "target 1");
     writable->DeactivateFrameBuffer(DiscardFramebufferBoth);
     EXPECT_EQ(queue.GetPendingCount(), 0);
     attachable->AttachToCanvas();
@@ -176,14 +176,14 @@ TEST_F(ScreenBitmap, ActivationIsPostedDeactivationIsNotAndAttachingOnlyCounts) 
 
     OnRenderThread const here;
     writable->ClearDepthStencilRT(true, 1, true, 1);
-    EXPECT_EQ(RecordingRenderer::CountCalls("ClearDepthStencil"), 0);
+    EXPECT_EQ(RendererTrace::CountCalls("ClearDepthStencil"), 0);
     screen->Ref();
     writable->DeactivateFrameBufferRT(true, DiscardFramebufferDepthStencil);
     EXPECT_EQ(CountOf(screen.Get()), 1);
     auto const direct = NewScreenRT(0, 0, 20, 10);
     direct->GetBitmapWritable()->ActivateFrameBuffer();
     direct->GetBitmapWritable()->DeactivateFrameBuffer(DiscardFramebufferColor);
-    std::vector<std::string> const calls = RecordingRenderer::TakeCalls();
+    std::vector<std::string> const calls = RendererTrace::TakeCalls();
     EXPECT_THAT(calls, Contains("target 1 Deactivate 0 1"));
     EXPECT_THAT(calls, Contains("target 2 Deactivate 1 0"));
 }
@@ -216,7 +216,7 @@ TEST_F(ScreenBitmap, AnUnknownTypeGivesOneErrorLineAndAnInertBitmap) {
     auto const type = static_cast<MKBitmap::FramebufferType>(5);
     auto const posted = BitmapPtr::Adopt(new MKScreenBitmap(&queue, 0, 0, 4, 4, type));
     queue.RunAll();
-    RecordingRenderer::DeclareRenderThread();
+    RendererTrace::DeclareRenderThread();
     auto const direct = BitmapPtr::Adopt(new MKScreenBitmapRT(&queue, 0, 0, 4, 4, type));
     EXPECT_THAT(log.GetTexts(ANDROID_LOG_ERROR), ElementsAre("createRenderTargetRT Invalid framebuffer type",
                                                              "MKScreenBitmapRT Invalid framebuffer type"));

@@ -27,7 +27,7 @@ TEST_F(SharedBitmap, ACloneMadeBeforeAnythingRanShowsTheImage) {
     for (int i = 0; i < 3; ++i) EXPECT_EQ(CountOf(StripOf(parent, i)) + CountOf(StripOf(clone, i)), 2);
     clone->GetBitmapReadable()->SetTextureWrap(TextureWrapRepeat); // sampling is each one's own
     queue.RunAll();
-    EXPECT_NE(RecordingRenderer::GetParameter(StripOf(parent)->GetTexture(), TextureParamWrappingS),
+    EXPECT_NE(RendererTrace::GetParameter(StripOf(parent)->GetTexture(), TextureParamWrappingS),
               TextureWrapRepeat);
 }
 

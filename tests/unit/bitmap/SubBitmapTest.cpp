@@ -38,7 +38,7 @@ TEST_F(SubBitmap, EveryPostedOperationHoldsOneReferenceUntilItRan) {
     EXPECT_EQ(strip->GetTexture(), nullptr);
     EXPECT_EQ(CountOf(strip.Get()), 17) << "with the construction's";
     queue.RunOne();
-    auto const get = [&](int id) { return RecordingRenderer::GetParameter(strip->GetTexture(), id); };
+    auto const get = [&](int id) { return RendererTrace::GetParameter(strip->GetTexture(), id); };
     EXPECT_EQ(get(TextureParamFilteringMin), TextureFilterLinear);
     EXPECT_EQ(get(TextureParamFilteringMag), TextureFilterLinear);
     EXPECT_EQ(queue.RunAll(), 15);
@@ -78,7 +78,7 @@ TEST_F(SubBitmap, ItsTasksReachTheOverridesOfADerivedClass) {
     use(*posted);
     use(*direct);
     queue.RunAll();
-    RecordingRenderer::DeclareRenderThread();
+    RendererTrace::DeclareRenderThread();
     EXPECT_EQ(posted->attachments + direct->attachments, 2);
     EXPECT_EQ(posted->filter, TextureFilterNearest);
     EXPECT_EQ(direct->filter, TextureFilterNearest);
@@ -105,12 +105,12 @@ TEST_F(SubBitmap, ItsGpuObjectsDieOnTheRenderThreadInOrder) {
     strip->CreateFrameBuffer();
     strip->AttachDepthBuffer();
     queue.RunAll();
-    RecordingRenderer::TakeCalls();
+    RendererTrace::TakeCalls();
     strip = {};
     EXPECT_EQ(queue.GetPendingCount(), 4);
-    EXPECT_TRUE(RecordingRenderer::TakeCalls().empty());
+    EXPECT_TRUE(RendererTrace::TakeCalls().empty());
     queue.RunAll();
-    EXPECT_EQ(RecordingRenderer::TakeCalls(),
+    EXPECT_EQ(RendererTrace::TakeCalls(),
               (std::vector<std::string>{"target 1 DetachDepthStencil buffer 1", "buffer 1 Release",
                                         "target 1 Release", "texture 1 Release"}));
 }
@@ -122,7 +122,7 @@ TEST_F(SubBitmap, ADeletionThatIsRefusedLeaksTheObjectAndNothingElse) {
     refuse = true;
     strip = {};
     refuse = false;
-    EXPECT_EQ(RecordingRenderer::CountLiveObjects(), 1);
+    EXPECT_EQ(RendererTrace::CountLiveObjects(), 1);
     OnRenderThread const here;
     delete texture;
 }
@@ -164,7 +164,7 @@ TEST_F(SubBitmap, ReadsAPixelByItsOwnOddBounds) {
 }
 
 TEST_F(SubBitmap, AsynchronousReadsCallBackEvenWhenThereIsNothingToRead) {
-    RecordingRenderer::FailCreations(ObjectKind::Texture);
+    RendererTrace::FailCreations(ObjectKind::kTexture);
     auto strip = MakeStrip(&queue, Rect(0, 0, 4, 4));
     Seen seen;
     Pixels untouched(64, 9);
@@ -172,7 +172,7 @@ TEST_F(SubBitmap, AsynchronousReadsCallBackEvenWhenThereIsNothingToRead) {
     strip->GetBitmapDataAsync(Rect(0, 0, 4, 4), untouched.data(), &seen, Seen::OnData);
     EXPECT_EQ(seen.calls, 0);
     queue.RunAll();
-    RecordingRenderer::StopFailing();
+    RendererTrace::StopFailing();
     EXPECT_EQ(seen.calls, 2);
     EXPECT_EQ(seen.pixel, 0u);
     EXPECT_EQ(seen.rect, Rect(0, 0, 4, 4));
@@ -245,7 +245,7 @@ TEST_F(SubBitmap, ACloneKeepsItsFrameBufferOnlyWhenTheSourceHasNone) {
     strip->SetTag("original");
     auto keeps = RefPtr<IMKSubBitmap>::Adopt(strip->Clone());
     queue.RunAll();
-    EXPECT_EQ(RecordingRenderer::GetTexels(keeps->GetTexture()), pixels);
+    EXPECT_EQ(RendererTrace::GetTexels(keeps->GetTexture()), pixels);
     EXPECT_EQ(LabelOf(keeps->GetTexture()), "original");
     EXPECT_EQ(CountOf(strip.Get()) + CountOf(keeps.Get()), 2);
     EXPECT_EQ(RendererFactory::GetStatistics().renderTargets, 1);
@@ -281,7 +281,7 @@ TEST_F(SubBitmap, TheRenderThreadFlavourDoesEverythingAtOnceAndCountsNothing) {
     strip = {};
     clone = {};
     EXPECT_EQ(queue.GetPostedCount(), 0);
-    EXPECT_EQ(RecordingRenderer::CountLiveObjects(), 0);
+    EXPECT_EQ(RendererTrace::CountLiveObjects(), 0);
 }
 
 } // namespace

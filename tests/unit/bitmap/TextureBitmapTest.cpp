@@ -84,8 +84,8 @@ TEST_F(TextureBitmap, UpdatesReachTheStripsTheyTouch) {
     auto const bitmap = NewBitmap(4, 2 * kMaxSide);
     auto const countUploads = [&] {
         queue.RunAll();
-        int const count = RecordingRenderer::CountCalls("Replace");
-        RecordingRenderer::TakeCalls();
+        int const count = RendererTrace::CountCalls("Replace");
+        RendererTrace::TakeCalls();
         return count;
     };
     Pixels const pixels = UniquePixels(4, kMaxSide);
@@ -93,7 +93,7 @@ TEST_F(TextureBitmap, UpdatesReachTheStripsTheyTouch) {
     EXPECT_EQ(countUploads(), 1);
     bitmap->GetTextureBitmap()->UpdateBitmap(pixels.data(), 0);
     EXPECT_EQ(countUploads(), 2) << "each strip, the same pixels";
-    EXPECT_EQ(RecordingRenderer::GetTexels(StripOf(bitmap, 1)->GetTexture()), pixels);
+    EXPECT_EQ(RendererTrace::GetTexels(StripOf(bitmap, 1)->GetTexture()), pixels);
 }
 
 TEST_F(TextureBitmap, CanvasesHoldItAndItsFrameBuffers) {
@@ -125,7 +125,7 @@ TEST_F(TextureBitmap, OnTheRenderThreadSamplingReachesEveryStripAndActivationThe
     writable->ActivateFrameBuffer();
     writable->DeactivateFrameBuffer(DiscardFramebufferNone);
     queue.RunAll();
-    EXPECT_EQ(RecordingRenderer::CountCalls("Activate"), 1);
+    EXPECT_EQ(RendererTrace::CountCalls("Activate"), 1);
     {
         OnRenderThread const here;
         // These ignore their release argument.
@@ -136,10 +136,8 @@ TEST_F(TextureBitmap, OnTheRenderThreadSamplingReachesEveryStripAndActivationThe
         EXPECT_EQ(CountOf(bitmap.Get()), 2);
         for (int i = 0; i < 2; ++i) {
             ITextureObject* const texture = StripOf(bitmap, i)->GetTexture();
-            EXPECT_EQ(RecordingRenderer::GetParameter(texture, TextureParamFilteringMag),
-                      TextureFilterNearest);
-            EXPECT_EQ(RecordingRenderer::GetParameter(texture, TextureParamWrappingS),
-                      TextureWrapMirroredRepeat);
+            EXPECT_EQ(RendererTrace::GetParameter(texture, TextureParamFilteringMag), TextureFilterNearest);
+            EXPECT_EQ(RendererTrace::GetParameter(texture, TextureParamWrappingS), TextureWrapMirroredRepeat);
         }
         for (int i = 0; i < 5; ++i) bitmap->Ref();
         readable->ActivateTextureRT(0, true);
@@ -151,8 +149,7 @@ TEST_F(TextureBitmap, OnTheRenderThreadSamplingReachesEveryStripAndActivationThe
         bitmap->GetTextureBitmap()->DetachStencilBufferRT(true);
         writable->DeactivateFrameBufferRT(true, DiscardFramebufferNone);
         EXPECT_EQ(CountOf(bitmap.Get()), 2);
-        EXPECT_EQ(RecordingRenderer::GetBoundTexture(0),
-                  RecordingRenderer::NameOf(StripOf(bitmap)->GetTexture()));
+        EXPECT_EQ(RendererTrace::GetBoundTexture(0), RendererTrace::NameOf(StripOf(bitmap)->GetTexture()));
     }
     Pixels const pixels = ReadAll(bitmap);
     EXPECT_EQ(PixelAt(pixels, 4, 0, 0), 0xFF0000FFu) << "red, as bytes in the order RGBA";

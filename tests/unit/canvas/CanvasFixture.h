@@ -1,4 +1,4 @@
-// CanvasFixture: canvases over the recording renderer and hand-pumped queues, and what they had drawn. Strips
+// CanvasFixture: canvases over the tracing renderer and hand-pumped queues, and what they had drawn. Strips
 // are 64 rows high. Every test ends with nothing alive and nothing misused.
 #pragma once
 
@@ -28,9 +28,7 @@ using Numbers = std::vector<float>;
 inline Numbers NumbersOf(Matrix4<float> const& m) { return {m.data(), m.data() + 16}; }
 
 // What a draw of a shape says about where it goes.
-inline Numbers ProjectionOf(RecordedDraw const& draw) {
-    return draw.uniforms.at("uProjectionMatrix").numbers;
-}
+inline Numbers ProjectionOf(TracedDraw const& draw) { return draw.uniforms.at("uProjectionMatrix").numbers; }
 
 // A drawable that does what the test says and counts its references.
 class FakeDrawable : public IMKCustomDrawable {
@@ -62,8 +60,8 @@ protected:
         target->SetTag("page");
         canvas = NewCanvas(target);
         queue.RunAll();
-        RecordingRenderer::TakeEvents();
-        RecordingRenderer::TakeCalls();
+        RendererTrace::TakeEvents();
+        RendererTrace::TakeCalls();
     }
     BitmapPtr NewScreen(int width, int height) {
         return BitmapPtr::Adopt(MKGraphicsFactory::CreateScreenBitmap(&queue, 0, 0, width, height, 1, 1));
@@ -76,30 +74,30 @@ protected:
     }
 
     // Runs what was posted.
-    std::vector<RecordedEvent> TakeEvents() {
+    std::vector<TracedEvent> TakeEvents() {
         queue.RunAll();
-        return RecordingRenderer::TakeEvents();
+        return RendererTrace::TakeEvents();
     }
-    std::vector<RecordedDraw> TakeDraws() {
-        std::vector<RecordedDraw> draws;
-        for (RecordedEvent const& event : TakeEvents())
-            if (auto const* draw = std::get_if<RecordedDraw>(&event)) draws.push_back(*draw);
+    std::vector<TracedDraw> TakeDraws() {
+        std::vector<TracedDraw> draws;
+        for (TracedEvent const& event : TakeEvents())
+            if (auto const* draw = std::get_if<TracedDraw>(&event)) draws.push_back(*draw);
         return draws;
     }
-    RecordedDraw TakeDraw() {
-        std::vector<RecordedDraw> const draws = TakeDraws();
+    TracedDraw TakeDraw() {
+        std::vector<TracedDraw> const draws = TakeDraws();
         EXPECT_EQ(draws.size(), 1u);
-        return draws.empty() ? RecordedDraw() : draws.back();
+        return draws.empty() ? TracedDraw() : draws.back();
     }
     // The draws and clears, as text.
     std::vector<std::string> TakePictures() {
         std::vector<std::string> pictures;
-        for (RecordedEvent const& event : TakeEvents()) {
+        for (TracedEvent const& event : TakeEvents()) {
             std::ostringstream text;
-            if (auto const* clear = std::get_if<RecordedClear>(&event)) {
+            if (auto const* clear = std::get_if<TracedClear>(&event)) {
                 for (float component : clear->color) text << component << ' ';
             } else {
-                auto const& draw = std::get<RecordedDraw>(event);
+                auto const& draw = std::get<TracedDraw>(event);
                 text << draw.shader << ' ';
                 for (float number : draw.vertices) text << number << ' ';
                 for (auto const& [name, value] : draw.uniforms) text << name << '=' << value.text;
@@ -112,9 +110,9 @@ protected:
     std::vector<std::string> TakeCalls(std::string const& operation) {
         queue.RunAll();
         std::vector<std::string> calls;
-        for (RecordedCall const& call : RecordingRenderer::GetCalls())
+        for (TracedCall const& call : RendererTrace::GetCalls())
             if (call.operation == operation) calls.push_back(ToString(call));
-        RecordingRenderer::TakeCalls();
+        RendererTrace::TakeCalls();
         return calls;
     }
 

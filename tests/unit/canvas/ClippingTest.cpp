@@ -42,7 +42,7 @@ protected:
         canvas->SetMatrix(m);
         PipelineState found;
         int draws = 0;
-        for (RecordedDraw const& draw : TakeDraws()) {
+        for (TracedDraw const& draw : TakeDraws()) {
             if (!draw.state.blend.IsColorWrite()) continue; // fills the stencil
             found = draw.state;
             ++draws;
@@ -105,7 +105,7 @@ TEST_F(Clipping, RectanglesIntersectFromTheLastReplaceOn) {
     Use(NewBitmap(50, kMaxSide + 36)); // every strip has its part
     Clip(10, 50, 20, 30);
     canvas->DrawRect(0, 0, 50, 1000, &paint);
-    std::vector<RecordedDraw> const draws = TakeDraws();
+    std::vector<TracedDraw> const draws = TakeDraws();
     ASSERT_THAT(draws, SizeIs(2));
     EXPECT_EQ(draws[1].state.scissor, (ScissorRect{10, -14, 20, 30}));
 }
@@ -132,7 +132,7 @@ TEST_F(Clipping, ADrawableFindsTheStencilAndColourWritesOn) {
     Clip(3, 4, 20, 30);
     FakeDrawable drawable; // whose own blending nobody sets
     drawable.onDraw = [](Matrix4<float> const&, MKPaint const&) {
-        PipelineState const state = RecordingRenderer::GetState();
+        PipelineState const state = RendererTrace::GetState();
         EXPECT_TRUE(state.stencilClip && state.blend.IsColorWrite());
         EXPECT_EQ(state.depthStencil.GetWriteMask(), 0u);
     };
@@ -153,7 +153,7 @@ TEST_F(Clipping, AStencilIsThereForOneDrawAndDrawnAnewForTheNext) {
                 ElementsAre(kWarning, "Stencil clipping was activateted for bitmap: page", kWarning,
                             "Stencil clipping was activateted for bitmap: page"));
     EXPECT_EQ(log.Find(kWarning).tag, "mok_log");
-    PipelineState const after = RecordingRenderer::GetState();
+    PipelineState const after = RendererTrace::GetState();
     EXPECT_FALSE(after.depthStencil.IsStencil() || after.stencilClip);
 
     canvas->Restore(0); // nothing saved
@@ -170,7 +170,7 @@ TEST_F(Clipping, StatesAndProgramAreThereBeforeTheFirstStencilClear) {
     canvas->Clear(0, 0, 0, 1); // without a drawable of its own
     queue.RunAll();
     std::vector<std::string> steps;
-    for (RecordedCall const& call : RecordingRenderer::GetCalls()) {
+    for (TracedCall const& call : RendererTrace::GetCalls()) {
         if (call.operation == "ClearDepthStencil") break;
         if (call.operation == "Apply" || call.operation == "MakeCurrent") steps.push_back(call.object);
     }
@@ -186,13 +186,13 @@ TEST_F(Clipping, TheShaderComesFirstAndTheClippingGoesBeforeTheDrawables) {
     for (bool const draws : {false, true}) {
         canvas = {};
         queue.RunAll();
-        RecordingRenderer::TakeCalls();
+        RendererTrace::TakeCalls();
         canvas = NewCanvas(target);
         EXPECT_THAT(take("Create"), ElementsAre("target", "program", "graphics", "graphics", "depthstencil",
                                                 "blend", "depthstencil"));
         if (draws) canvas->DrawRect(1, 1, 9, 9, &paint);
         queue.RunAll();
-        RecordingRenderer::TakeCalls();
+        RendererTrace::TakeCalls();
         canvas = {};
         if (draws)
             EXPECT_THAT(take("Release"),
@@ -217,9 +217,9 @@ TEST_F(Clipping, AClippedDrawLeavesTheScissorAsItWasAndAnUnclippedOneOff) {
     for (bool on : {false, true}) {
         setScissor(on);
         EXPECT_EQ(Scissor(), (ScissorRect{1, 2, 3, 4}));
-        EXPECT_EQ(RecordingRenderer::GetState().scissorOn, on);
+        EXPECT_EQ(RendererTrace::GetState().scissorOn, on);
     }
-    EXPECT_EQ(RecordingRenderer::GetState().scissor, (ScissorRect{5, 6, 7, 8}));
+    EXPECT_EQ(RendererTrace::GetState().scissor, (ScissorRect{5, 6, 7, 8}));
 }
 
 // Straight to the clipping, on the render thread.
@@ -227,17 +227,17 @@ class ClipCounts : public Clipping {
 protected:
     void SetUp() override {
         Clipping::SetUp();
-        RecordingRenderer::DeclareRenderThread();
+        RendererTrace::DeclareRenderThread();
         clipping = std::make_unique<MKCanvasClipping>(target.Get());
     }
     void TearDown() override {
         clipping.reset();
-        RecordingRenderer::DeclareNoRenderThread();
+        RendererTrace::DeclareNoRenderThread();
         Clipping::TearDown();
     }
     PipelineState Enabled() {
         clipping->EnableClipRT(0);
-        PipelineState const state = RecordingRenderer::GetState();
+        PipelineState const state = RendererTrace::GetState();
         clipping->DisableClipRT();
         return state;
     }
@@ -253,9 +253,9 @@ TEST_F(ClipCounts, MoreThanThereAreAddsEmptyOnesAndFewerDropTheLast) {
     EXPECT_EQ(Enabled().scissor, (ScissorRect{0, kHeight, 0, 0}));
     // An all-zero matrix hides its rectangle from the stencil too; the identity would show (0, 0).
     clipping->AddClipRectRT({1, 1, 9, 9, Union, {}});
-    RecordingRenderer::TakeEvents();
+    RendererTrace::TakeEvents();
     EXPECT_TRUE(Enabled().depthStencil.IsStencil());
-    EXPECT_EQ(ProjectionOf(RecordingRenderer::GetDraws()[2])[0], 0.0f);
+    EXPECT_EQ(ProjectionOf(RendererTrace::GetDraws()[2])[0], 0.0f);
     clipping->RemoveClipRectRT(0);
     EXPECT_FALSE(Enabled().scissorOn);
 }

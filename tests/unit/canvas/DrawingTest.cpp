@@ -28,7 +28,7 @@ protected:
     // Which of the target's strips the draws since the last call went to.
     std::vector<std::string> TakeTargets() {
         std::vector<std::string> targets;
-        for (RecordedDraw const& draw : TakeDraws()) targets.push_back(draw.target);
+        for (TracedDraw const& draw : TakeDraws()) targets.push_back(draw.target);
         return targets;
     }
 };
@@ -54,7 +54,7 @@ TEST_F(Drawing, AShapeIsDrawnOnEachStripThatItsMappedCornersTouch) {
     EXPECT_THAT(TakeTargets(), ElementsAre("target 1"));
     canvas->DrawCircle(30, 70, 6.5f, &paint);
     EXPECT_THAT(TakeTargets(), ElementsAre("target 1", "target 2"));
-    EXPECT_EQ(RecordingRenderer::GetActiveTarget(), "none") << "given back";
+    EXPECT_EQ(RendererTrace::GetActiveTarget(), "none") << "given back";
 }
 
 TEST_F(Drawing, ShapesWithoutExtentMakeNoDrawable) {
@@ -93,12 +93,12 @@ TEST_F(Drawing, ATallBitmapIsDrawnInClampedPiecesAndOneThatTilesWhole) {
     auto const texture = [&](int i) { return StripOf(source, i)->GetTexture(); };
     // Source rows 32 to 64 go to 0 to 64, which is strip 0; rows 64 to 80 to 64 to 96, strip 1.
     canvas->DrawBitmap(source.Get(), RectF(0, 32, 10, 80), RectF(0, 0, 20, 96), &paint);
-    std::vector<RecordedDraw> const draws = TakeDraws();
+    std::vector<TracedDraw> const draws = TakeDraws();
     ASSERT_THAT(draws, SizeIs(2));
     for (int i = 0; i < 2; ++i) {
-        RecordedDraw const& draw = draws[static_cast<std::size_t>(i)];
+        TracedDraw const& draw = draws[static_cast<std::size_t>(i)];
         EXPECT_EQ(draw.target, "target " + std::to_string(i + 1));
-        EXPECT_EQ(draw.textures.at(0), RecordingRenderer::NameOf(texture(i)));
+        EXPECT_EQ(draw.textures.at(0), RendererTrace::NameOf(texture(i)));
         EXPECT_EQ(draw.vertices[1], i == 0 ? 0 : 64);
         EXPECT_EQ(draw.vertices[4], i == 0 ? 0.5f : 0) << "v of row 32 of the first strip, and of row 0";
         EXPECT_EQ(draw.vertices[5 + 1], i == 0 ? 64 : 96) << "the lower left corner";
@@ -108,9 +108,9 @@ TEST_F(Drawing, ATallBitmapIsDrawnInClampedPiecesAndOneThatTilesWhole) {
          {std::pair(MKPaint::Default, MKPaint::Mirror), {MKPaint::Mirror, MKPaint::Default}}) {
         paint.SetTileMode(x, y);
         canvas->DrawBitmap(source.Get(), RectF(0, 32, 10, 80), RectF(0, 0, 20, 96), &paint);
-        std::vector<RecordedDraw> const whole = TakeDraws(); // with strip 0
+        std::vector<TracedDraw> const whole = TakeDraws(); // with strip 0
         ASSERT_THAT(whole, SizeIs(2));
-        EXPECT_EQ(whole[1].textures.at(0), RecordingRenderer::NameOf(texture(0)));
+        EXPECT_EQ(whole[1].textures.at(0), RendererTrace::NameOf(texture(0)));
         EXPECT_EQ(whole[1].vertices[4], 0.4f) << "row 32 of 80";
     }
 }
@@ -119,7 +119,7 @@ TEST_F(Drawing, ABatchDrawsWhatIsVisibleAtOnceIntoTheFirstStrip) {
     auto const source = NewBitmap(10, 10);
     std::vector<RectF> const dsts{{-20, 0, -10, 9}, {1, 2, 3, 4}, {0, 70, 9, 80}, {90, 0, 99, 9}};
     canvas->DrawBitmaps(source.Get(), RectF(0, 0, 5, 5), dsts, &paint);
-    RecordedDraw const draw = TakeDraw();
+    TracedDraw const draw = TakeDraw();
     EXPECT_EQ(draw.target, "target 1");
     EXPECT_EQ(draw.count, 12) << "the second and the third";
     EXPECT_EQ(draw.vertices[0], 1);
@@ -145,7 +145,7 @@ TEST_F(Drawing, ACustomDrawableIsDrawnOnEveryStripAsFrameBufferMinusOne) {
     std::vector<std::string> targets;
     std::vector<Numbers> projections;
     drawable.onDraw = [&](Matrix4<float> const& projection, MKPaint const&) {
-        targets.push_back(RecordingRenderer::GetActiveTarget());
+        targets.push_back(RendererTrace::GetActiveTarget());
         projections.push_back(NumbersOf(projection));
     };
     canvas->PreTranslate(1000, 1000); // nothing is culled
@@ -166,18 +166,18 @@ TEST_F(Drawing, ADrawableThatThrowsLeavesNoTargetClipOrReferenceBehind) {
     canvas->SetClipRect(0, 0, 10, 10, IMKCanvasBase::Intersect);
     canvas->Draw(&drawable, &paint);
     EXPECT_THROW(queue.RunAll(), std::runtime_error);
-    RecordingRenderer::DeclareNoRenderThread();
+    RendererTrace::DeclareNoRenderThread();
     EXPECT_EQ(drawable.references, 1);
-    EXPECT_EQ(RecordingRenderer::GetActiveTarget(), "none");
-    EXPECT_FALSE(RecordingRenderer::GetState().scissorOn);
+    EXPECT_EQ(RendererTrace::GetActiveTarget(), "none");
+    EXPECT_FALSE(RendererTrace::GetState().scissorOn);
 }
 
-// When the vertices of a new drawable are refused, memory runs out for the rest of its making.
+// When the vertices of a new drawable are refused, memory runs out for the rest of its making: for its shader,
+// which throws. A rectangle's exists already, because the clip has it.
 TEST_F(Drawing, ADrawableWhoseConstructionThrowsIsTriedAgainAndNothingIsKept) {
     auto const source = NewBitmap(4, 4);
     std::vector<PointF> const points{{1, 1}, {9, 9}};
     std::function<void()> const requests[] = {
-        [&] { canvas->DrawRect(1, 1, 9, 9, &paint); },
         [&] { canvas->DrawLine(1, 1, 9, 9, &paint); },
         [&] { canvas->DrawSimpleLines(points, &paint); },
         [&] { canvas->DrawRoundRect(1, 1, 9, 9, 2, 2, &paint); },
@@ -191,7 +191,7 @@ TEST_F(Drawing, ADrawableWhoseConstructionThrowsIsTriedAgainAndNothingIsKept) {
         request();
         bool thrown = false;
         std::optional<FailAllocations> outOfMemory;
-        RecordingRenderer::FailCreations(ObjectKind::GraphicsObject);
+        RendererTrace::FailCreations(ObjectKind::kGraphicsObject);
         LogSink const previous = SetLogSink([&](LogLine const&) {
             if (!outOfMemory) outOfMemory.emplace();
         });
@@ -202,10 +202,10 @@ TEST_F(Drawing, ADrawableWhoseConstructionThrowsIsTriedAgainAndNothingIsKept) {
         }
         outOfMemory.reset();
         SetLogSink(previous);
-        RecordingRenderer::StopFailing();
-        RecordingRenderer::DeclareNoRenderThread();
+        RendererTrace::StopFailing();
+        RendererTrace::DeclareNoRenderThread();
         EXPECT_TRUE(thrown);
-        EXPECT_EQ(RecordingRenderer::CountCalls("Activate"), 0);
+        EXPECT_EQ(RendererTrace::CountCalls("Activate"), 0);
         EXPECT_EQ(CountOf(source.Get()), 1);
         request();
         EXPECT_THAT(TakeDraws(), ::testing::Not(IsEmpty()));
@@ -217,8 +217,8 @@ TEST_F(Drawing, ClearingGivesItsTargetBackAndClearingAllLeavesTheScissorOff) {
     canvas->SetClipRect(10, 50, 20, 30, IMKCanvasBase::Intersect);
     canvas->Clear(0.25f, 0.5f, 0.75f, 1);
     queue.RunAll();
-    EXPECT_EQ(RecordingRenderer::GetActiveTarget(), "none");
-    std::vector<RecordedClear> clears = RecordingRenderer::GetClears();
+    EXPECT_EQ(RendererTrace::GetActiveTarget(), "none");
+    std::vector<TracedClear> clears = RendererTrace::GetClears();
     ASSERT_THAT(clears, SizeIs(2));
     EXPECT_EQ(clears[1].state.scissor, (ScissorRect{10, -14, 20, 30}));
     {
@@ -228,11 +228,11 @@ TEST_F(Drawing, ClearingGivesItsTargetBackAndClearingAllLeavesTheScissorOff) {
     }
     canvas->ClearAll(static_cast<int>(0xFF000000u));
     queue.RunAll();
-    clears = RecordingRenderer::GetClears();
+    clears = RendererTrace::GetClears();
     ASSERT_THAT(clears, SizeIs(4));
     EXPECT_FALSE(clears[2].state.scissorOn || clears[3].state.scissorOn);
-    EXPECT_FALSE(RecordingRenderer::GetState().scissorOn) << "stays off";
-    EXPECT_EQ(RecordingRenderer::GetState().scissor, (ScissorRect{1, 2, 3, 4}));
+    EXPECT_FALSE(RendererTrace::GetState().scissorOn) << "stays off";
+    EXPECT_EQ(RendererTrace::GetState().scissor, (ScissorRect{1, 2, 3, 4}));
 }
 
 } // namespace

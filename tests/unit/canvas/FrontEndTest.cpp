@@ -26,7 +26,7 @@ TEST_F(FrontEnd, ARequestHasTheMatrixOfItsTimeAndWithoutAPaintANewOne) {
     canvas->DrawRect(RectF(1, 2, 30, 40), nullptr);
     Matrix3<float> const m = canvas->GetMatrix();
     canvas->SetMatrix(Matrix3<float>(0.0f));
-    RecordedDraw const draw = TakeDraw();
+    TracedDraw const draw = TakeDraw();
     EXPECT_EQ(ProjectionOf(draw),
               NumbersOf(target->GetBitmapWritable()->GetProjectionMatrix() * FromMatrix3(m)));
     EXPECT_EQ(draw.state.scissor, (ScissorRect{5, 6, 10, 10}));
@@ -74,7 +74,7 @@ TEST_F(FrontEnd, SavedLevelsHoldMatrixAndClipCountOrThePreviousOnes) {
     // Whether the clip of a draw right now is on.
     auto const isClipped = [&] {
         queue.RunAll();
-        RecordingRenderer::TakeEvents();
+        RendererTrace::TakeEvents();
         canvas->DrawRect(-99, -99, 99, 99, &paint);
         return TakeDraw().state.scissorOn;
     };
@@ -166,7 +166,7 @@ TEST_F(FrontEnd, ASourceIsHeldUntilDrawnAndWhatCannotBeDrawnIsNotPosted) {
     canvas->DrawBitmaps(source.Get(), points, &paint);
     EXPECT_EQ(CountOf(source.Get()), 3);
     source = {};
-    std::vector<RecordedDraw> const draws = TakeDraws();
+    std::vector<TracedDraw> const draws = TakeDraws();
     ASSERT_THAT(draws, SizeIs(2));
     EXPECT_THAT(draws[0].vertices, ElementsAre(3, 4, 1, 0, 0, 3, 24, 1, 0, 1, 13, 4, 1, 1, 0, 13, 4, 1, 1, 0,
                                                3, 24, 1, 0, 1, 13, 24, 1, 1, 1));
@@ -197,11 +197,11 @@ TEST_F(FrontEnd, RefusedRequestsAreDroppedAndOnlyTheReferencesStay) {
     canvas->Save(IMKCanvasBase::SaveAll);
     canvas->Restore(0);
     canvas->DrawRect(0, 0, 20, 20, &paint);
-    RecordingRenderer::TakeEvents();
+    RendererTrace::TakeEvents();
     picky.RunAll();
-    ASSERT_THAT(RecordingRenderer::GetDraws(), SizeIs(1));
-    EXPECT_TRUE(RecordingRenderer::GetDraws()[0].state.scissorOn);
-    EXPECT_EQ(RecordingRenderer::GetDraws()[0].state.scissor.width, 0);
+    ASSERT_THAT(RendererTrace::GetDraws(), SizeIs(1));
+    EXPECT_TRUE(RendererTrace::GetDraws()[0].state.scissorOn);
+    EXPECT_EQ(RendererTrace::GetDraws()[0].state.scissor.width, 0);
     canvas = {};
     picky.RunAll();
 }

@@ -20,13 +20,13 @@ TEST_F(PenCanvas, TheClipIsThatOfTheWholeBitmapWhateverTheIndexAndReachesGl) {
     auto const clipped = [&](int frameBuffer) {
         queue.RunAll();
         OnRenderThread const here;
-        RecordingRenderer::TakeCalls();
+        RendererTrace::TakeCalls();
         pen->EnableClipRT(frameBuffer);
-        PipelineState const state = RecordingRenderer::GetState();
-        calls = RecordingRenderer::TakeCalls();
+        PipelineState const state = RendererTrace::GetState();
+        calls = RendererTrace::TakeCalls();
         EXPECT_EQ(calls.back(), "renderer Commit");
         pen->DisableClipRT();
-        EXPECT_EQ(RecordingRenderer::TakeCalls().back(), "renderer InvalidateState");
+        EXPECT_EQ(RendererTrace::TakeCalls().back(), "renderer InvalidateState");
         return state;
     };
     EXPECT_FALSE(clipped(0).scissorOn);
@@ -41,7 +41,7 @@ TEST_F(PenCanvas, TheClipIsThatOfTheWholeBitmapWhateverTheIndexAndReachesGl) {
     pen->SetClipRect(1, 2, 20, 70, IMKCanvasBase::Intersect);
     PipelineState const state = clipped(0);
     EXPECT_TRUE(state.stencilClip && state.blend.IsColorWrite());
-    EXPECT_FALSE(RecordingRenderer::GetState().stencilClip);
+    EXPECT_FALSE(RendererTrace::GetState().stencilClip);
     EXPECT_THAT(calls, ::testing::Not(Contains(HasSubstr("AttachDepthStencil")))) << "no strip's own";
 }
 
@@ -49,8 +49,8 @@ TEST_F(PenCanvas, ItClearsWithinItsClipAndGivesTheTargetBack) {
     target = NewBitmap(50, 60);
     for (bool direct : {false, true}) {
         queue.RunAll();
-        if (direct) RecordingRenderer::DeclareRenderThread();
-        RecordingRenderer::TakeEvents();
+        if (direct) RendererTrace::DeclareRenderThread();
+        RendererTrace::TakeEvents();
         auto pen = PenCanvasPtr::Adopt(MKGraphicsFactory::CreatePenCanvas(&queue, target.Get(), !direct));
         EXPECT_EQ(CountOf(target.Get()), 3);
         pen->Save(IMKCanvasBase::SaveAll);
@@ -61,13 +61,13 @@ TEST_F(PenCanvas, ItClearsWithinItsClipAndGivesTheTargetBack) {
         pen->Clear(0, 1, 0, 1);
         pen = {};
         EXPECT_EQ(queue.RunAll() == 0, direct);
-        std::vector<RecordedClear> const clears = RecordingRenderer::GetClears();
+        std::vector<TracedClear> const clears = RendererTrace::GetClears();
         ASSERT_THAT(clears, SizeIs(3));
         EXPECT_EQ(clears[0].color, (std::array<float, 4>{1, 0, 0, 1}));
         EXPECT_EQ(clears[0].state.scissor, (ScissorRect{1, 2, 20, 30}));
         EXPECT_FALSE(clears[1].state.scissorOn || clears[2].state.scissorOn);
         EXPECT_EQ(CountOf(target.Get()), 1);
-        RecordingRenderer::DeclareNoRenderThread();
+        RendererTrace::DeclareNoRenderThread();
     }
 }
 
@@ -111,15 +111,15 @@ TEST_F(PenCanvas, WithoutAFrameBufferNoClipIsMadeAndEachEnableSaysSo) {
     queue.RunAll();
     OnRenderThread const here;
     log.Clear();
-    RecordingRenderer::TakeEvents();
+    RendererTrace::TakeEvents();
     for (int enables = 1; enables <= 2; ++enables) {
         pen->EnableClipRT(0);
-        EXPECT_FALSE(RecordingRenderer::GetState().stencilClip);
+        EXPECT_FALSE(RendererTrace::GetState().stencilClip);
         pen->DisableClipRT();
         EXPECT_THAT(log.GetTexts(ANDROID_LOG_ERROR), SizeIs(enables));
     }
     EXPECT_THAT(log.GetTexts(ANDROID_LOG_ERROR), Contains(HasSubstr("no frame buffer")).Times(2));
-    EXPECT_THAT(RecordingRenderer::TakeEvents(), SizeIs(0));
+    EXPECT_THAT(RendererTrace::TakeEvents(), SizeIs(0));
 }
 
 } // namespace

@@ -134,11 +134,11 @@ TEST_F(Checkers, APenCanvasAnswersTheSameThroughOne) {
     EXPECT_EQ(checker.GetBitmap(), target.Get());
     queue.RunAll();
     OnRenderThread const here;
-    RecordingRenderer::TakeCalls();
+    RendererTrace::TakeCalls();
     checker.EnableClipRT(0);
-    EXPECT_EQ(RecordingRenderer::TakeCalls().back(), "renderer Commit");
+    EXPECT_EQ(RendererTrace::TakeCalls().back(), "renderer Commit");
     checker.DisableClipRT();
-    EXPECT_EQ(RecordingRenderer::TakeCalls().back(), "renderer InvalidateState");
+    EXPECT_EQ(RendererTrace::TakeCalls().back(), "renderer InvalidateState");
 }
 
 TEST_F(Checkers, ABitmapAnswersTheSameThroughOne) {

@@ -27,7 +27,7 @@ protected:
             RefPtr<IMKBitmap>::Adopt(MKGraphicsFactory::CreateBitmap(&queue, 8, 4, nullptr, false, 0, false));
         readable = bitmap->GetBitmapReadable();
         drawable.emplace(&queue);
-        RecordingRenderer::TakeCalls();
+        RendererTrace::TakeCalls();
     }
     void TearDown() override {
         drawable.reset();
@@ -49,7 +49,7 @@ protected:
     // What was done to textures other than the bitmap's own, without their parameters.
     static std::vector<std::string> TakeTextureCalls() {
         std::vector<std::string> calls;
-        for (std::string const& call : RecordingRenderer::TakeCalls())
+        for (std::string const& call : RendererTrace::TakeCalls())
             if (call.rfind("texture", 0) == 0 && call.rfind("texture 1 ", 0) != 0 &&
                 call.find("SetParameter") == std::string::npos)
                 calls.push_back(call);
@@ -86,7 +86,7 @@ TEST_F(BitmapDrawableTest, TheCornersCarryTheCornersOfTheSource) {
                                        MKPaint()));
     EXPECT_TRUE(drawable->DrawBitmapsRT(readable, bounds, bounds, RectF(12, 21, 16, 23), &dsts, projection,
                                         MKPaint()));
-    for (RecordedDraw const& shifted : TakeDraws()) {
+    for (TracedDraw const& shifted : TakeDraws()) {
         EXPECT_THAT(VerticesOf(shifted).front(), ElementsAre(0, 0, 1, 0.25f, 0.25f));
         EXPECT_THAT(VerticesOf(shifted).back(), ElementsAre(5, 5, 1, (16.0f + 10.0f) / 8.0f, 0.75f));
     }
@@ -104,7 +104,7 @@ TEST_F(BitmapDrawableTest, ABatchIsTheSameVerticesInOneDraw) {
             expected.insert(expected.end(), one.begin(), one.end());
         }
         EXPECT_TRUE(DrawBatch(dsts, paint));
-        RecordedDraw const batch = TakeDraw();
+        TracedDraw const batch = TakeDraw();
         EXPECT_EQ(batch.count, antiAliased ? 90 : 18);
         EXPECT_EQ(batch.vertices, expected);
     }
@@ -118,9 +118,9 @@ TEST_F(BitmapDrawableTest, TheDrawUsesThePaintAndTheBitmapAndLeavesTheStencilAlo
     ForceOtherStates();
     EXPECT_TRUE(Draw(RectF(0, 0, 5, 5), paint));
     EXPECT_TRUE(DrawBatch({RectF(0, 0, 5, 5)}, paint));
-    std::vector<RecordedDraw> const draws = TakeDraws();
+    std::vector<TracedDraw> const draws = TakeDraws();
     EXPECT_THAT(draws, SizeIs(2));
-    for (RecordedDraw const& draw : draws) {
+    for (TracedDraw const& draw : draws) {
         ExpectCommonState(draw);
         EXPECT_TRUE(draw.state.depthStencil.IsStencil());
         EXPECT_EQ(draw.textures.at(0), "texture 1");
@@ -130,13 +130,13 @@ TEST_F(BitmapDrawableTest, TheDrawUsesThePaintAndTheBitmapAndLeavesTheStencilAlo
 
 TEST_F(BitmapDrawableTest, OnlyOneGpuGetsTheProgramThatClampsColors) {
     for (std::string const gpu : {"Mali-T830", "Mali-T830 MP2", "Mali-T83"}) {
-        RecordingRenderer::SetGpuName(gpu);
+        RendererTrace::SetGpuName(gpu.c_str());
         drawable.reset();
-        RecordingRenderer::TakeCalls();
+        RendererTrace::TakeCalls();
         drawable.emplace(&queue);
         char const* const program = gpu == "Mali-T830" ? "MKBitmapShaderColorClamp" : "MKBitmapShader";
         std::vector<std::string> programs;
-        for (RecordedCall const& call : RecordingRenderer::GetCalls()) {
+        for (TracedCall const& call : RendererTrace::GetCalls()) {
             if (call.operation == "Create" && call.object.rfind("program", 0) == 0)
                 programs.push_back(call.arguments);
         }
@@ -144,7 +144,7 @@ TEST_F(BitmapDrawableTest, OnlyOneGpuGetsTheProgramThatClampsColors) {
         ForceOtherStates();
         EXPECT_TRUE(Draw(RectF(0, 0, 5, 5), CommonPaint()));
         EXPECT_TRUE(DrawBatch({RectF(0, 0, 5, 5)}, CommonPaint()));
-        for (RecordedDraw const& draw : TakeDraws()) {
+        for (TracedDraw const& draw : TakeDraws()) {
             EXPECT_EQ(draw.shader, program);
             ExpectCommonState(draw);
         }
@@ -157,8 +157,8 @@ TEST_F(BitmapDrawableTest, EachAxisWrapsAsThePaintSaysAndAnUnknownModeLeavesItAl
         MKPaint paint;
         paint.SetTileMode(static_cast<MKPaint::TileMode>(x), static_cast<MKPaint::TileMode>(y));
         Draw(RectF(0, 0, 5, 5), paint);
-        return std::array<int, 2>{RecordingRenderer::GetParameter(texture, 0),
-                                  RecordingRenderer::GetParameter(texture, 1)};
+        return std::array<int, 2>{RendererTrace::GetParameter(texture, 0),
+                                  RendererTrace::GetParameter(texture, 1)};
     };
     EXPECT_THAT(wrap(2, 3), ElementsAre(3, 0));
     EXPECT_THAT(wrap(4, 0), ElementsAre(3, 1));
@@ -193,7 +193,7 @@ TEST_F(BitmapDrawableTest, TheSizeOfTheDestinationIsSetBeforeTheTintsSwitch) {
     paint.SetXFermode(MKPaint::Darken);
     Draw(RectF(0, 0, 5, 5), paint);
     std::string values;
-    for (RecordedCall const& call : RecordingRenderer::GetCalls())
+    for (TracedCall const& call : RendererTrace::GetCalls())
         if (call.operation == "SetParameter" && call.object == "program 2")
             values += call.arguments.substr(0, call.arguments.find(' ') + 1);
     EXPECT_EQ(values, "uProjectionMatrix uColor uTintColor uDstTextureSize uHasTintColor uBlendingMode "
@@ -204,7 +204,7 @@ TEST_F(BitmapDrawableTest, ItReleasesGeometryStatesProgramsAndCopyInThatOrder) {
     MKPaint paint;
     paint.SetXFermode(MKPaint::Darken);
     Draw(RectF(0, 0, 5, 5), paint);
-    RecordingRenderer::TakeCalls();
+    RendererTrace::TakeCalls();
     drawable.reset();
     EXPECT_THAT(TakeObjects("Release"), ElementsAre("graphics 1", "blend 1", "depthstencil 1", "program 1",
                                                     "program 2", "texture 2"));
@@ -215,9 +215,9 @@ TEST_F(BitmapDrawableTest, WithoutACopyOfTheDestinationNothingIsDrawn) {
     paint.SetXFermode(MKPaint::Darken);
     for (float const size : {kNaN, kInfinity, -kInfinity, 3e9f, 0.0f, 0.5f, -5.0f})
         EXPECT_FALSE(Draw(RectF(0, 0, 5, 5), paint, RectF(0, 0, size, 10))) << size;
-    RecordingRenderer::FailCreations(ObjectKind::Texture);
+    RendererTrace::FailCreations(ObjectKind::kTexture);
     EXPECT_FALSE(Draw(RectF(0, 0, 5, 5), paint));
-    RecordingRenderer::StopFailing();
+    RendererTrace::StopFailing();
     EXPECT_THAT(TakeDraws(), IsEmpty());
     EXPECT_TRUE(Draw(RectF(0, 0, 5, 5), paint, RectF(0, 0, 20, 10)));
 }

@@ -23,6 +23,8 @@ protected:
         first = NewBitmap(40, 20);
         second = NewBitmap(8, 8);
         queue.RunAll();
+        OnRenderThread const here;
+        RendererFactory::SetDeferred(true);
         paint = CommonPaint();
         paint.SetTileMode(MKPaint::Repeat);
     }
@@ -62,27 +64,27 @@ protected:
     // Whether anything was drawn; if not, nothing at all was done.
     bool Draws(IMKCustomDrawable& drawable) {
         OnRenderThread const here;
-        RecordingRenderer::TakeCalls();
-        RecordingRenderer::TakeEvents();
+        RendererTrace::TakeCalls();
+        RendererTrace::TakeEvents();
         drawable.DrawRT(projection, paint);
-        bool const draws = !RecordingRenderer::TakeEvents().empty();
-        EXPECT_NE(RecordingRenderer::TakeCalls().empty(), draws);
+        bool const draws = !RendererTrace::TakeEvents().empty();
+        EXPECT_NE(RendererTrace::TakeCalls().empty(), draws);
         return draws;
     }
     // One draw, with the states and the tiling that all have in common.
-    RecordedDraw Draw(IMKCustomDrawable& drawable) {
+    TracedDraw Draw(IMKCustomDrawable& drawable) {
         OnRenderThread const here;
         ForceOtherStates();
-        RecordingRenderer::TakeEvents();
+        RendererTrace::TakeEvents();
         drawable.DrawRT(projection, paint);
-        std::vector<RecordedDraw> const draws = RecordingRenderer::GetDraws();
+        std::vector<TracedDraw> const draws = RendererTrace::GetDraws();
         EXPECT_EQ(draws.size(), 1u);
         if (draws.empty()) return {};
         EXPECT_FALSE(draws[0].state.depthStencil.IsStencil());
         EXPECT_EQ(draws[0].state.blend.GetColorEquation().destination, BlendingFactor::SrcAlpha);
-        EXPECT_EQ(draws[0].textures.at(0), RecordingRenderer::NameOf(TextureOf(first)));
+        EXPECT_EQ(draws[0].textures.at(0), RendererTrace::NameOf(TextureOf(first)));
         for (int axis : {TextureParamWrappingS, TextureParamWrappingT})
-            EXPECT_EQ(RecordingRenderer::GetParameter(TextureOf(first), axis), TextureWrapRepeat);
+            EXPECT_EQ(RendererTrace::GetParameter(TextureOf(first), axis), TextureWrapRepeat);
         return draws[0];
     }
     static ITextureObject* TextureOf(BitmapPtr const& bitmap) { return StripOf(bitmap)->GetTexture(); }
@@ -105,9 +107,9 @@ TEST_F(CustomDrawablesTest, GpuObjectsAreMadeAndReleasedByTasksInOrder) {
         EXPECT_EQ(drawable->Unref(), 0);
         EXPECT_EQ(CountOf(first.Get()) + CountOf(second.Get()), 2);
         for (char const* kind : {"graphics", "blend", "depthstencil", "program"}) {
-            RecordingRenderer::TakeCalls();
+            RendererTrace::TakeCalls();
             EXPECT_TRUE(queue.RunOne());
-            RecordedCall const call = RecordingRenderer::GetCalls().at(0);
+            TracedCall const call = RendererTrace::GetCalls().at(0);
             EXPECT_EQ(call.object.substr(0, call.object.find(' ')) + " " + call.operation,
                       std::string(kind) + " Release");
         }
@@ -136,17 +138,17 @@ TEST_F(CustomDrawablesTest, ARefusedConstructionLeavesADrawableThatDrawsNothingA
 TEST_F(CustomDrawablesTest, ARefusedReleaseLeaksThatObjectAndNothingElse) {
     RefusingQueue refusesTheProgram({5}); // after the construction and three releases
     RunOnRenderThread(refusesTheProgram);
-    int const alive = RecordingRenderer::CountLiveObjects();
+    int const alive = RendererTrace::CountLiveObjects();
     Makers()[2](&refusesTheProgram)->Unref();
     refusesTheProgram.RunAll();
-    EXPECT_EQ(RecordingRenderer::CountLiveObjects(), alive + 1 + 3); // with its parameters
+    EXPECT_EQ(RendererTrace::CountLiveObjects(), alive + 1 + 3); // with its parameters
 
     OnRenderThread const here;
     ShaderManager& manager = *ShaderManager::GetInstance();
     auto* const leaked = manager.GetShader<MKTextMaskBitmapShader>();
     manager.ReleaseShader(leaked);
     manager.ReleaseShader(leaked);
-    EXPECT_EQ(RecordingRenderer::CountLiveObjects(), alive);
+    EXPECT_EQ(RendererTrace::CountLiveObjects(), alive);
 }
 
 TEST_F(CustomDrawablesTest, SettersTakeReferencesAndAConstructorAdoptsThem) {
@@ -176,7 +178,7 @@ TEST_F(CustomDrawablesTest, EachDrawsItsRectangleWithItsUniforms) {
                             std::vector<float> const& vertices, Names const& uniforms,
                             std::string const& values) {
         SCOPED_TRACE(shader);
-        RecordedDraw const draw = Draw(drawable);
+        TracedDraw const draw = Draw(drawable);
         EXPECT_EQ(draw.shader, shader);
         bool const isStrip = draw.count == 4;
         EXPECT_EQ(draw.primitive, isStrip ? PrimitiveType::TriangleStrip : PrimitiveType::TriangleList);
@@ -185,19 +187,19 @@ TEST_F(CustomDrawablesTest, EachDrawsItsRectangleWithItsUniforms) {
         return draw;
     };
     auto const blend = Constructed(NewBlended(&queue, 0, 0));
-    RecordedDraw draw =
+    TracedDraw draw =
         expect(*blend, "MKBlenderBitmapsShader",
                {1, 2, 1, 0.25f, 0.25f, 1, 4, 1, 0.25f, 0.75f, 3, 2, 1, 0.75f, 0.25f,
                 3, 2, 1, 0.75f, 0.25f, 1, 4, 1, 0.25f, 0.75f, 3, 4, 1, 0.75f, 0.75f},
                {"uProjectionMatrix", "uFactor", "uSrcTexture1", "uSrcTexture2", "uHasTintColor"},
                "0.75 | 0 | 1 | 1");
-    EXPECT_EQ(draw.textures.at(1), RecordingRenderer::NameOf(TextureOf(second)));
+    EXPECT_EQ(draw.textures.at(1), RendererTrace::NameOf(TextureOf(second)));
 
     auto const over = Constructed(New<MKNonPremultipliedColorDrawable>(&queue, first.Get(), second.Get()));
     draw =
         expect(*over, "MKNonPremultipliedColorShader", {0, 0, 0, 0, 0, 20, 0, 1, 40, 0, 1, 0, 40, 20, 1, 1},
                {"projectionMatrix", "srcTexture", "dstTexture"}, "0 | 1");
-    EXPECT_EQ(draw.textures.at(1), RecordingRenderer::NameOf(TextureOf(second)));
+    EXPECT_EQ(draw.textures.at(1), RendererTrace::NameOf(TextureOf(second)));
 
     auto const mask = Constructed(New<MKTextMaskBitmapDrawable>(&queue, first.Get()));
     mask->SetDstPosition(2.5f, -3);

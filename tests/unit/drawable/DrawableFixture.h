@@ -1,4 +1,4 @@
-// DrawableFixture: drawables over the recording renderer, and what reached it of them.
+// DrawableFixture: drawables over the tracing renderer, and what reached it of them.
 #pragma once
 
 #include "moka/graphics/canvas/MKPaint.h"
@@ -16,7 +16,7 @@ constexpr float kInfinity = std::numeric_limits<float>::infinity();
 
 using Vertex = std::vector<float>;
 
-inline std::vector<Vertex> VerticesOf(RecordedDraw const& draw) {
+inline std::vector<Vertex> VerticesOf(TracedDraw const& draw) {
     auto const size = static_cast<std::size_t>(draw.floatsPerVertex);
     std::vector<Vertex> vertices;
     for (std::size_t i = 0; i + size <= draw.vertices.size(); i += size) {
@@ -27,7 +27,7 @@ inline std::vector<Vertex> VerticesOf(RecordedDraw const& draw) {
 }
 
 // The values of uniforms, one after the other.
-inline std::string Values(RecordedDraw const& draw, std::vector<std::string> const& uniforms) {
+inline std::string Values(TracedDraw const& draw, std::vector<std::string> const& uniforms) {
     std::string values;
     for (std::string const& name : uniforms) {
         auto const found = draw.uniforms.find(name);
@@ -48,9 +48,9 @@ inline MKPaint CommonPaint() {
 // The objects that were made, or released, since the calls were last taken, in their order.
 inline std::vector<std::string> TakeObjects(std::string const& operation) {
     std::vector<std::string> objects;
-    for (RecordedCall const& call : RecordingRenderer::GetCalls())
+    for (TracedCall const& call : RendererTrace::GetCalls())
         if (call.operation == operation) objects.push_back(call.object);
-    RecordingRenderer::TakeCalls();
+    RendererTrace::TakeCalls();
     return objects;
 }
 
@@ -68,21 +68,27 @@ inline void ForceOtherStates() {
 
 class DrawableFixture : public ShaderFixture {
 protected:
+    // Without a target, the state of an immediate renderer is the host's.
+    void SetUp() override {
+        ShaderFixture::SetUp();
+        RendererFactory::SetDeferred(true);
+    }
+
     // Those since the last call.
-    static std::vector<RecordedDraw> TakeDraws() {
-        std::vector<RecordedDraw> draws;
-        for (RecordedEvent const& event : RecordingRenderer::TakeEvents())
-            if (auto const* draw = std::get_if<RecordedDraw>(&event)) draws.push_back(*draw);
+    static std::vector<TracedDraw> TakeDraws() {
+        std::vector<TracedDraw> draws;
+        for (TracedEvent const& event : RendererTrace::TakeEvents())
+            if (auto const* draw = std::get_if<TracedDraw>(&event)) draws.push_back(*draw);
         return draws;
     }
-    static RecordedDraw TakeDraw() {
-        std::vector<RecordedDraw> const draws = TakeDraws();
+    static TracedDraw TakeDraw() {
+        std::vector<TracedDraw> const draws = TakeDraws();
         EXPECT_EQ(draws.size(), 1u);
-        return draws.empty() ? RecordedDraw() : draws.back();
+        return draws.empty() ? TracedDraw() : draws.back();
     }
 
     // What CommonPaint and the projection must have become, whoever draws.
-    static void ExpectCommonState(RecordedDraw const& draw) {
+    static void ExpectCommonState(TracedDraw const& draw) {
         EXPECT_EQ(Values(draw, {"uProjectionMatrix", "uColor", "uTintColor", "uHasTintColor"}),
                   "2 0 0 0 0 3 0 0 0 0 1 0 -1 0.5 0 1 | 0.5 0.25 0.125 0.75 | 1 0 0.5 0.25 | 1");
         EXPECT_TRUE(draw.state.blend.IsBlending());

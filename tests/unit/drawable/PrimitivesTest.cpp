@@ -45,7 +45,7 @@ TEST_F(PrimitivesTest, StylesAndWidthsDecideWhatIsDrawn) {
     };
     auto const takeCounts = [] {
         std::vector<int> counts;
-        for (RecordedDraw const& draw : TakeDraws()) counts.push_back(draw.count);
+        for (TracedDraw const& draw : TakeDraws()) counts.push_back(draw.count);
         return counts;
     };
     MKRectDrawable rect;
@@ -101,9 +101,9 @@ TEST_F(PrimitivesTest, ThePointsAreFreedUnlessTheLineIsTooThin) {
     drawable.DrawLineRT(PointF(), PointF(5, 5), projection, Paint(MKPaint::Fill, 0.9f, true));
     drawable.DrawSimpleLineRT(PointF(), PointF(5, 5), projection, Paint(MKPaint::Fill, 0.9f, true));
     drawable.DrawSimpleLinesRT(nullptr, projection, MKPaint());
-    RecordingRenderer::FailCreations(ObjectKind::GraphicsObject);
+    RendererTrace::FailCreations(ObjectKind::kGraphicsObject);
     MKLineDrawable refused;
-    RecordingRenderer::StopFailing();
+    RendererTrace::StopFailing();
     EXPECT_TRUE(isFreed(refused, 4, 1));
     EXPECT_THAT(TakeDraws(), IsEmpty());
 }
@@ -141,22 +141,22 @@ TEST_F(PrimitivesTest, EveryDrawAppliesThePaintAndItsOwnStates) {
     paint.SetLineWidth(2);
     auto const draw = [&] {
         primitives.DrawAll(RectF(2, 2, 12, 12), 3, projection, paint);
-        std::vector<RecordedDraw> draws = TakeDraws();
+        std::vector<TracedDraw> draws = TakeDraws();
         EXPECT_THAT(draws, SizeIs(1 + 4 + 2 + 3));
         return draws;
     };
-    RecordingRenderer::TakeCalls();
-    std::vector<RecordedDraw> const draws = draw();
-    EXPECT_EQ(RecordingRenderer::CountCalls("SetDescriptor"), 1 + 1 + 1 + 3) << "equal ones as well";
-    for (RecordedDraw const& each : draws) {
+    RendererTrace::TakeCalls();
+    std::vector<TracedDraw> const draws = draw();
+    EXPECT_EQ(RendererTrace::CountCalls("SetDescriptor"), 1 + 1 + 1 + 3) << "equal ones as well";
+    for (TracedDraw const& each : draws) {
         ExpectCommonState(each);
         EXPECT_FALSE(each.state.depthStencil.IsStencil() || each.state.depthStencil.IsDepth());
     }
     paint.ClearTintColor();
-    for (RecordedDraw const& each : draw()) EXPECT_EQ(Values(each, {"uHasTintColor"}), "0");
+    for (TracedDraw const& each : draw()) EXPECT_EQ(Values(each, {"uHasTintColor"}), "0");
     for (int mode : {-1, 19, 1000000}) { // any other number is source over
         paint.SetXFermode(static_cast<MKPaint::XFermode>(mode));
-        for (RecordedDraw const& each : draw()) {
+        for (TracedDraw const& each : draw()) {
             EXPECT_EQ(each.state.blend.GetColorEquation().destination, BlendingFactor::OneMinusSrcAlpha);
         }
     }
@@ -167,7 +167,7 @@ TEST_F(PrimitivesTest, EveryDrawAppliesThePaintAndItsOwnStates) {
 
 template <class Drawable>
 std::string ObjectsOf() {
-    RecordingRenderer::TakeCalls();
+    RendererTrace::TakeCalls();
     auto drawable = std::make_unique<Drawable>();
     std::vector<std::string> const made = TakeObjects("Create");
     drawable.reset();

@@ -1,4 +1,4 @@
-// ShaderFixture: shaders over the recording renderer, on the render thread. Every test ends with nothing
+// ShaderFixture: shaders over the tracing renderer, on the render thread. Every test ends with nothing
 // alive that was not before, and nothing misused.
 #pragma once
 
@@ -6,7 +6,7 @@
 #include "moka/graphics/drawable/ShaderManager.h"
 #include "moka/graphics/drawable/Shaders.h"
 #include "tests/support/LogCapture.h"
-#include "tests/support/RecordingRenderer.h"
+#include "tests/support/RendererTrace.h"
 
 #include <gmock/gmock.h>
 
@@ -18,16 +18,16 @@ namespace Moka::Testing {
 class ShaderFixture : public ::testing::Test {
 protected:
     void SetUp() override {
-        RecordingRenderer::Reset();
+        RendererTrace::Reset();
         ASSERT_TRUE(RendererFactory::AttachContext());
-        expectedAlive = RecordingRenderer::CountLiveObjects();
+        expectedAlive = RendererTrace::CountLiveObjects();
     }
 
     void TearDown() override {
-        EXPECT_EQ(RecordingRenderer::CountLiveObjects(), expectedAlive);
-        EXPECT_THAT(RecordingRenderer::GetViolations(), ::testing::IsEmpty());
+        EXPECT_EQ(RendererTrace::CountLiveObjects(), expectedAlive);
+        EXPECT_THAT(RendererTrace::GetViolations(), ::testing::IsEmpty());
         RendererFactory::DetachContext();
-        RecordingRenderer::Reset();
+        RendererTrace::Reset();
     }
 
     ShaderManager& manager = *ShaderManager::GetInstance();

@@ -104,7 +104,7 @@ TEST_F(ShaderManagerTest, AWrongTypeStopsTheConstructionAndLeavesNoEntry) {
     auto* const bystander = manager.GetShader<MKCircleShader>();
     for (int attempt = 0; attempt < 2; ++attempt) {
         log.Clear();
-        RecordingRenderer::TakeCalls();
+        RendererTrace::TakeCalls();
         try {
             manager.GetShader<WrongShader>();
             ADD_FAILURE() << "nothing thrown";
@@ -117,7 +117,7 @@ TEST_F(ShaderManagerTest, AWrongTypeStopsTheConstructionAndLeavesNoEntry) {
         EXPECT_EQ(log.Find("ParameterBinding<>::bind - invalid parameter type!").format, "%s");
         // The program is not released, the bindings are, backwards.
         std::string const program = "program " + std::to_string(attempt + 2) + " ";
-        EXPECT_THAT(RecordingRenderer::TakeCalls(),
+        EXPECT_THAT(RendererTrace::TakeCalls(),
                     ElementsAre(program + "Create WrongShader", program + "GetParameter first 2",
                                 program + "GetParameter absent 0", program + "GetParameter wrong 7",
                                 program + "ReleaseParameter wrong", program + "ReleaseParameter absent",

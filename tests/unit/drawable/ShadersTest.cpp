@@ -31,10 +31,10 @@ class ShadersTest : public ShaderFixture {};
 
 TEST_F(ShadersTest, AssignedValuesReachTheProgramAndMissingUniformsSwallowThem) {
     {
-        RecordingRenderer::TakeCalls();
+        RendererTrace::TakeCalls();
         EveryKindShader shader;
         std::string const get = "program 1 GetParameter ";
-        EXPECT_THAT(RecordingRenderer::TakeCalls(),
+        EXPECT_THAT(RendererTrace::TakeCalls(),
                     ElementsAre("program 1 Create EveryKindShader", get + "flag 1", get + "matrix 2",
                                 get + "pair 3", get + "color 5", get + "number 6", get + "count 7",
                                 get + "texture 8", get + "missing 0"));
@@ -47,9 +47,9 @@ TEST_F(ShadersTest, AssignedValuesReachTheProgramAndMissingUniformsSwallowThem) 
         shader.count = -3;
         (shader.texture = 1) = 2; // the assignment gives the binding back
         shader.missing = Vector4<float>();
-        EXPECT_EQ(RecordingRenderer::GetCurrentProgram(), "program 1");
+        EXPECT_EQ(RendererTrace::GetCurrentProgram(), "program 1");
         auto const value = [&](char const* name) {
-            return RecordingRenderer::GetParameter(shader.program, name);
+            return RendererTrace::GetParameter(shader.program, name);
         };
         EXPECT_EQ(value("flag"), "1");
         EXPECT_EQ(value("matrix"), "1 2 3 4 5 6 7 8 9 10 11 12 13 14 15 16");
@@ -58,11 +58,11 @@ TEST_F(ShadersTest, AssignedValuesReachTheProgramAndMissingUniformsSwallowThem) 
         EXPECT_EQ(value("number"), "2.5");
         EXPECT_EQ(value("count"), "-3");
         EXPECT_EQ(value("texture"), "2");
-        EXPECT_EQ(RecordingRenderer::CountCalls("SetParameter"), 9);
-        RecordingRenderer::TakeCalls();
+        EXPECT_EQ(RendererTrace::CountCalls("SetParameter"), 9);
+        RendererTrace::TakeCalls();
     }
-    EXPECT_EQ(RecordingRenderer::GetCurrentProgram(), "none");
-    std::vector<std::string> const calls = RecordingRenderer::TakeCalls(); // backwards
+    EXPECT_EQ(RendererTrace::GetCurrentProgram(), "none");
+    std::vector<std::string> const calls = RendererTrace::TakeCalls(); // backwards
     EXPECT_EQ(calls.front(), "program 1 Release");
     EXPECT_EQ(calls.back(), "program 1 ReleaseParameter flag");
     EXPECT_THAT(log.GetTexts(), IsEmpty());
@@ -88,8 +88,8 @@ TEST_F(ShadersTest, AssigningToWhatWasNeverBoundOrFailedToBindThrows) {
         EXPECT_THAT(log.GetTexts(ANDROID_LOG_ERROR),
                     ElementsAre("ParameterBinding: internal interface is not initialized!"));
     }
-    EXPECT_EQ(RecordingRenderer::CountCalls("SetParameter"), 0);
-    EXPECT_EQ(RecordingRenderer::CountCalls("ReleaseParameter"), 2);
+    EXPECT_EQ(RendererTrace::CountCalls("SetParameter"), 0);
+    EXPECT_EQ(RendererTrace::CountCalls("ReleaseParameter"), 2);
 }
 
 // Where a mediump float has 16 bits a place above 1024 is known to a whole unit, and a wide bitmap skips texels.

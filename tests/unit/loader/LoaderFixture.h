@@ -14,9 +14,9 @@
 #include "moka/graphics/loader/BitmapLoaderImpl.h"
 #include "moka/graphics/loader/MKBitmapLoader.h"
 #include "tests/support/LogCapture.h"
-#include "tests/support/RecordingRenderer.h"
-#include "tests/support/RecordingThread.h"
+#include "tests/support/RendererTrace.h"
 #include "tests/support/TestFiles.h"
+#include "tests/support/TracingThread.h"
 #include "tests/unit/loader/CodecGate.h"
 
 #include <algorithm>
@@ -55,7 +55,7 @@ protected:
 
     void SetUp() override {
         MKBitmapFactory_UseNativeDecoder();
-        queue = std::make_unique<RecordingThread>(kMaxSide);
+        queue = std::make_unique<TracingThread>(kMaxSide);
         StartLoop();
     }
 
@@ -65,8 +65,8 @@ protected:
         AwaitIdle();
         System::SetBuildTypeEngMode(false);
         queue.reset();
-        EXPECT_EQ(RecordingRenderer::CountLiveObjects(), 0);
-        for (std::string const& violation : RecordingRenderer::GetViolations()) ADD_FAILURE() << violation;
+        EXPECT_EQ(RendererTrace::CountLiveObjects(), 0);
+        for (std::string const& violation : RendererTrace::GetViolations()) ADD_FAILURE() << violation;
     }
 
     virtual void StartLoop() { ASSERT_TRUE(MKBitmapLoader::startEventLoopBySelf()); }
@@ -119,7 +119,7 @@ protected:
 
     TempFolder folder;
     LogCapture log;
-    std::unique_ptr<RecordingThread> queue;
+    std::unique_ptr<TracingThread> queue;
 };
 
 // What a listener is told, in order: "pending", "load 1 5x4", "error 1", "save 1", "save error 1",

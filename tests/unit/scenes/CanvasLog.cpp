@@ -3,7 +3,7 @@
 #include "moka/graphics/bitmap/IMKBitmap.h"
 #include "scenes/SceneRenderer.h"
 #include "tests/support/Queues.h"
-#include "tests/support/RecordingRenderer.h"
+#include "tests/support/RendererTrace.h"
 
 #include <algorithm>
 
@@ -57,11 +57,11 @@ void CanvasLog::Write(MKPaint const* paint) {
 }
 
 RefPtr<CanvasLog> PlayScene(Scenes::Scene const& scene) {
-    RecordingRenderer::Reset();
-    RecordingRenderer::DeclareNoRenderThread();
+    RendererTrace::Reset();
+    RendererTrace::DeclareNoRenderThread();
     HandPumpedQueue queue;
-    queue.SetAroundRun([] { RecordingRenderer::DeclareRenderThread(); },
-                       [] { RecordingRenderer::DeclareNoRenderThread(); });
+    queue.SetAroundRun([] { RendererTrace::DeclareRenderThread(); },
+                       [] { RendererTrace::DeclareNoRenderThread(); });
     Scenes::QueueStage stage(queue);
     RefPtr<CanvasLog> canvas = RefPtr<CanvasLog>::Adopt(new CanvasLog);
     DrawScene(scene, *canvas, stage);

@@ -1,22 +1,22 @@
-// RecordingThread: a render thread without GL: a real queue whose thread drives the recording renderer, which
+// TracingThread: a render thread without GL: a real queue whose thread drives the tracing renderer, which
 // keeps no records.
 #pragma once
 
 #include "moka/host/TaskQueue.h"
 #include "moka/renderer/RendererFactory.h"
-#include "tests/support/RecordingRenderer.h"
+#include "tests/support/RendererTrace.h"
 
 #include <future>
 #include <thread>
 
 namespace Moka::Testing {
 
-class RecordingThread final : public TaskQueue {
+class TracingThread final : public TaskQueue {
 public:
-    explicit RecordingThread(int maxTextureSize) {
-        RecordingRenderer::Reset();
-        RecordingRenderer::KeepRecords(false);
-        RecordingRenderer::SetMaxTextureSize(maxTextureSize);
+    explicit TracingThread(int maxTextureSize) {
+        RendererTrace::Reset();
+        RendererTrace::KeepRecords(false);
+        RendererTrace::SetMaxTextureSize(maxTextureSize);
         std::promise<void> attached;
         mThread = std::thread([&] {
             RendererFactory::AttachContext();
@@ -26,7 +26,7 @@ public:
         });
         attached.get_future().wait();
     }
-    ~RecordingThread() override {
+    ~TracingThread() override {
         RequestStop();
         mThread.join();
     }

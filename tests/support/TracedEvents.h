@@ -1,11 +1,8 @@
-// RecordedDraw, RecordedClear: what would have changed a picture, in order, each with the state in force.
+// TracedDraw, TracedClear: what would have changed a picture, in order, each with the state in force.
 // Values, independent of the objects they tell of: those may be gone when a test looks.
 #pragma once
 
-#include "moka/renderer/BlendStateDescriptor.h"
-#include "moka/renderer/DepthStencilStateDescriptor.h"
-#include "moka/renderer/IGraphicsObject.h"
-#include "moka/renderer/IRasterizerState.h"
+#include "moka/renderer/device/RunState.h"
 
 #include <array>
 #include <map>
@@ -15,28 +12,21 @@
 
 namespace Moka::Testing {
 
-// The fixed-function state, as a context starts with it: nothing is tested, nothing is blended.
+// The fixed-function state that was requested.
 struct PipelineState {
-    BlendStateDescriptor blend = ReplacingBlend();
+    BlendStateDescriptor blend = detail::RunState::WithoutBlending();
     DepthStencilStateDescriptor depthStencil{false, false}; // the tests in force, not what was last applied
     bool scissorOn = false;
     ScissorRect scissor;
     bool stencilClip = false;
-
-private:
-    static BlendStateDescriptor ReplacingBlend() {
-        BlendStateDescriptor blend(false);
-        blend.SetEnabled(false, true);
-        return blend;
-    }
 };
 
-struct RecordedUniform {
+struct TracedUniform {
     std::string text;           // as in the calls
     std::vector<float> numbers; // a bool, an int and a texture unit are one; matrices are column-major
 };
 
-struct RecordedDraw {
+struct TracedDraw {
     PipelineState state;
     std::string target; // "target 1"; "none" when nothing is active
     std::string buffer; // the depth-stencil buffer attached to it, or "none"
@@ -48,13 +38,13 @@ struct RecordedDraw {
     int first = 0; // of the vertices handed over
     int count = 0; // that were there and were drawn
 
-    std::string program;                             // "program 1"
-    std::string shader;                              // the name its creator gave it
-    std::map<std::string, RecordedUniform> uniforms; // those ever set, by name
-    std::map<int, std::string> textures;             // "texture 1" by unit
+    std::string program;                           // "program 1"
+    std::string shader;                            // the name its creator gave it
+    std::map<std::string, TracedUniform> uniforms; // those ever set, by name
+    std::map<int, std::string> textures;           // "texture 1" by unit
 };
 
-struct RecordedClear {
+struct TracedClear {
     PipelineState state;
     std::string target; // what is cleared, whichever target is active
     std::string buffer; // attached to it, or "none"
@@ -67,6 +57,6 @@ struct RecordedClear {
     int stencil = 0;
 };
 
-using RecordedEvent = std::variant<RecordedDraw, RecordedClear>;
+using TracedEvent = std::variant<TracedDraw, TracedClear>;
 
 } // namespace Moka::Testing

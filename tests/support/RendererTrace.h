@@ -1,0 +1,108 @@
+// RendererTrace: what a test knows of the renderer, and plans for it. The renderer is the real one over a device
+// without a driver (TracingDevice.h); the trace observes it: it writes down each request, counts what is alive,
+// fails creations where a test asks it to, and notices misuse that a driver would answer with a leak, a black
+// picture or a crash much later.
+// Owner:   one per process, never destroyed.
+// Thread:  from any thread, except what asks for the renderer's state: the active target, the current program,
+//          the pipeline state, texels and parameters of textures belong to the thread that attached the context.
+// Order:   of arrival, whatever the draw list does with the requests.
+// Misuse:  a request on another thread than the declared one or after the object's release; a depth-stencil
+//          buffer released while attached. The request goes on: the test fails by looking at GetViolations().
+//          Stricter than the interface in one point: a texture deleted off the render thread counts too.
+//          Released objects are known by their address; the memory is not touched, and a call that reads it is
+//          the address sanitizer's business.
+#pragma once
+
+#include "moka/renderer/record/Observer.h"
+#include "tests/support/TracedEvents.h"
+
+#include <string>
+#include <vector>
+
+namespace Moka {
+class IShaderProgram;
+class ITextureObject;
+} // namespace Moka
+
+namespace Moka::Testing {
+
+using detail::ObjectKind;
+
+// One request. Objects are named by kind and number in order of creation: "texture 1", "target 1", "buffer 1",
+// "program 1", "graphics 1", "blend 1", "depthstencil 1"; static functions belong to "renderer", those of the
+// scissor to "rasterizer". Operations are named as in the interfaces; the deletion of a texture is its
+// "Release", a creation is the new object's "Create"; what is done to a handle on a parameter is an operation
+// of its program: "program 1 SetParameter uFactor 0.5", "program 1 ReleaseParameter uFactor".
+struct TracedCall {
+    std::string object;
+    std::string operation;
+    std::string arguments; // separated by spaces
+};
+
+// "texture 1 SetParameter 4 1"
+std::string ToString(TracedCall const& call);
+
+class RendererTrace {
+public:
+    // Back to the beginning: no context, no calls, no violations, no planned failures, the usual capabilities,
+    // numbers from 1. Objects still alive are inert and may be released later. A context that is still attached
+    // is detached here, on the thread that attached it.
+    static void Reset();
+
+    static std::vector<TracedCall> GetCalls();
+    // The calls as lines, which are then forgotten.
+    static std::vector<std::string> TakeCalls();
+    static int CountCalls(std::string const& operation);
+
+    // The draws and the clears, as values, in order; GetEvents() has both in their common order. A draw
+    // without a current program is none, one of no vertices is one.
+    static std::vector<TracedDraw> GetDraws();
+    static std::vector<TracedClear> GetClears();
+    static std::vector<TracedEvent> GetEvents();
+    // The events, which are then forgotten.
+    static std::vector<TracedEvent> TakeEvents();
+    // What a draw would find now.
+    static PipelineState GetState();
+
+    // Off, for long runs: calls, events and values of parameters are forgotten and kept no more, and a released
+    // object is forgotten at once. On again after Reset().
+    static void KeepRecords(bool keep);
+
+    static std::vector<std::string> GetViolations();
+
+    // What the device offers, 4096 texels and "tracing renderer" unless set. Takes effect at once, in place of
+    // the limit of a context that is attached.
+    static void SetMaxTextureSize(int texels);
+    static void SetGpuName(char const* name);
+
+    // Makes the n-th creation from now fail (1 is the next one), or every one of a kind until
+    // StopFailing(). Programs are made in every case and are not counted.
+    static void FailCreation(int n);
+    static void FailCreations(ObjectKind kind);
+    static void StopFailing();
+
+    // The render thread is the one that attached the context. A test whose queue is pumped on that thread
+    // declares it while tasks run and none in between, so that a call that should have been a task is noticed.
+    static void DeclareRenderThread(); // the calling thread
+    static void DeclareNoRenderThread();
+
+    // The name in the calls, for a pointer to any interface of the renderer; "none" for null. Still valid after
+    // the object's release, until its memory is used again.
+    static std::string NameOf(void const* object);
+    // The image, rows packed, in texture order.
+    static std::vector<unsigned char> GetTexels(ITextureObject const* texture);
+    // The value last set, or the initial one; -1 for an id that names no parameter.
+    static int GetParameter(ITextureObject const* texture, int id);
+
+    // Names as in the calls, "none" for nothing.
+    static std::string GetActiveTarget();
+    static std::string GetCurrentProgram();
+    static std::string GetBoundTexture(int unit);
+    // What a uniform was set to last: its numbers, separated by spaces; empty before.
+    static std::string GetParameter(IShaderProgram const* program, std::string const& name);
+
+    // Objects not yet released, and handles on parameters not yet deleted, of whatever context.
+    static int CountLiveObjects();
+};
+
+} // namespace Moka::Testing
