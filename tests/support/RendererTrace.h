@@ -1,16 +1,13 @@
 // RendererTrace: what a test knows of the renderer, and plans for it. The renderer is the real one over a device
-// without a driver (TracingDevice.h); the trace observes it: it writes down each request, counts what is alive,
-// fails creations where a test asks it to, and notices misuse that a driver would answer with a leak, a black
-// picture or a crash much later.
+// without a driver (TracingDevice.h); the trace observes it: it writes down each request in the order of arrival,
+// counts what is alive, fails creations where a test asks it to, and notices misuse that a driver would answer with
+// a leak, a black picture or a crash much later.
 // Owner:   one per process, never destroyed.
-// Thread:  from any thread, except what asks for the renderer's state: the active target, the current program,
-//          the pipeline state, texels and parameters of textures belong to the thread that attached the context.
-// Order:   of arrival, whatever the draw list does with the requests.
-// Misuse:  a request on another thread than the declared one or after the object's release; a depth-stencil
-//          buffer released while attached. The request goes on: the test fails by looking at GetViolations().
-//          Stricter than the interface in one point: a texture deleted off the render thread counts too.
-//          Released objects are known by their address; the memory is not touched, and a call that reads it is
-//          the address sanitizer's business.
+// Thread:  any; but pipeline state, texels, textures' parameters, the active target and the current program are
+//          for the thread that attached the context.
+// Misuse:  a request on another thread than the declared one, or after the object's release as far as its address
+//          tells; a depth-stencil buffer released while attached. The request goes on: the test fails by looking
+//          at GetViolations(). A texture deleted off the render thread counts too, which the interface allows.
 #pragma once
 
 #include "moka/renderer/record/Observer.h"
@@ -45,8 +42,8 @@ std::string ToString(TracedCall const& call);
 class RendererTrace {
 public:
     // Back to the beginning: no context, no calls, no violations, no planned failures, the usual capabilities,
-    // numbers from 1. Objects still alive are inert and may be released later. A context that is still attached
-    // is detached here, on the thread that attached it.
+    // numbers from 1. Objects still alive are inert and may be released later. On the thread that attached the
+    // context, if there is one.
     static void Reset();
 
     static std::vector<TracedCall> GetCalls();

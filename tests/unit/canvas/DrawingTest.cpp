@@ -190,19 +190,16 @@ TEST_F(Drawing, ADrawableWhoseConstructionThrowsIsTriedAgainAndNothingIsKept) {
         canvas->SetClipRect(0, 0, 50, 50, IMKCanvasBase::Intersect);
         request();
         bool thrown = false;
-        std::optional<FailAllocations> outOfMemory;
-        RendererTrace::FailCreations(ObjectKind::kGraphicsObject);
-        LogSink const previous = SetLogSink([&](LogLine const&) {
-            if (!outOfMemory) outOfMemory.emplace();
+        // Out of the drawable's constructor, where its program is new to the manager.
+        LogSink const previous = SetLogSink([&](LogLine const& line) {
+            if (line.format.find("is added") != std::string::npos) throw std::bad_alloc();
         });
         try {
             queue.RunAll();
         } catch (std::bad_alloc const&) {
             thrown = true;
         }
-        outOfMemory.reset();
         SetLogSink(previous);
-        RendererTrace::StopFailing();
         RendererTrace::DeclareNoRenderThread();
         EXPECT_TRUE(thrown);
         EXPECT_EQ(RendererTrace::CountCalls("Activate"), 0);

@@ -1,0 +1,139 @@
+// What the recorder keeps over flushes, contexts and threads. Pictures are for the tests with a driver.
+#include "moka/renderer/record/Recorder.h"
+#include "moka/renderer/IParameterBinding.h"
+#include "moka/renderer/IRasterizerState.h"
+#include "moka/renderer/IRenderTarget.h"
+#include "moka/renderer/IShaderProgram.h"
+#include "moka/renderer/ITextureObject.h"
+#include "moka/renderer/RendererFactory.h"
+#include "moka/renderer/record/Observer.h"
+#include "moka/renderer/record/ProgramState.h"
+#include "tests/support/RendererTrace.h"
+#include "tests/unit/base/Allocation.h"
+
+#include <gtest/gtest.h>
+
+#include <cstring>
+#include <thread>
+#include <utility>
+
+namespace Moka::Testing {
+namespace {
+
+constexpr std::uint64_t kBytes = 4 * sizeof(float); // of the vertices that these tests hand over
+
+class RecorderTest : public ::testing::Test {
+protected:
+    RecorderTest() {
+        RendererTrace::Reset();
+        RendererFactory::AttachContext();
+        RendererFactory::SetDeferred(true);
+        VertexDescriptor descriptor;
+        descriptor.addAttribute(VertexAttributeType::Float, 1, -1, 0);
+        graphics = RendererFactory::CreateGraphicsObject(1, PrimitiveType::TriangleList, &descriptor, 0, 0);
+        program = RendererFactory::CreateShaderProgram("", "uniform float uWidth;", "Sample");
+        width = program->GetParameter("uWidth");
+        texture = RendererFactory::CreateTextureObject(TextureDescriptor(2, 2, 0, 2, 6, 1, false, nullptr),
+                                                       nullptr, 0, {});
+        target = RendererFactory::CreateOffscreenRenderTarget(texture);
+        program->MakeCurrent();
+        target->Activate();
+        RendererFactory::Flush();
+    }
+    ~RecorderTest() override {
+        graphics->Release();
+        delete width;
+        program->Release();
+        if (target) target->Release();
+        delete texture;
+        RendererTrace::Reset();
+    }
+
+    void SetVertices(std::initializer_list<float> vertices) {
+        graphics->SetVertices(0, std::data(vertices), static_cast<int>(vertices.size()));
+    }
+    static std::uint64_t CountVertexBytes() { return RendererFactory::GetStatistics().vertexBytes; }
+    float GetWidthInForce() const {
+        float value = 0;
+        std::memcpy(&value, detail::GetAttachedRecorder()->requested->GetProgram()->GetValues(),
+                    sizeof value);
+        return value;
+    }
+
+    IGraphicsObject* graphics = nullptr;
+    IShaderProgram* program = nullptr;
+    IParameterBinding* width = nullptr;
+    ITextureObject* texture = nullptr;
+    IRenderTarget* target = nullptr;
+};
+
+TEST_F(RecorderTest, VerticesAreHandedOverOnceAndDrawnAgainAfterAFlush) {
+    SetVertices({9, 9, 9, 9}); // never drawn
+    SetVertices({0, 1, 2, 3});
+    EXPECT_TRUE(graphics->Draw(0, -1, 1));
+    EXPECT_TRUE(graphics->Draw(1, 2, 1));
+    RendererFactory::Flush();
+    EXPECT_EQ(CountVertexBytes(), kBytes);
+    target->Activate();
+    EXPECT_TRUE(graphics->Draw(1, 2, 1));
+    RendererFactory::Flush();
+    EXPECT_EQ(CountVertexBytes(), 2 * kBytes);
+    EXPECT_EQ(RendererFactory::GetStatistics().draws, 3u);
+    for (TracedDraw const& draw : RendererTrace::GetDraws()) {
+        EXPECT_EQ(draw.vertices[static_cast<std::size_t>(1 - draw.first)], 1);
+    }
+}
+
+TEST_F(RecorderTest, AProgramBuiltAgainInANewContextKeepsItsValuesAndHandles) {
+    float value = 2.5f;
+    width->Set(&value);
+    RendererFactory::DetachContext();
+    value = 3;
+    width->Set(&value);
+    RendererFactory::AttachContext();
+    EXPECT_EQ(RendererFactory::GetStatistics().programs, 0);
+    program->MakeCurrent();
+    EXPECT_EQ(RendererFactory::GetStatistics().programs, 1);
+    EXPECT_EQ(GetWidthInForce(), 3);
+    value = 4;
+    width->Set(&value);
+    EXPECT_EQ(GetWidthInForce(), 4);
+}
+
+TEST_F(RecorderTest, WhatAnotherThreadDropsIsDeletedByTheNextRequestThatFindsItUnused) {
+    target->ClearColor(1, 1, 1, 1);
+    target->Deactivate(false, false);
+    target->Release();
+    target = nullptr;
+    std::thread([this] { delete std::exchange(texture, nullptr); }).join();
+    EXPECT_EQ(RendererFactory::GetStatistics().textureObjects, 0);
+    program->MakeCurrent();
+    EXPECT_EQ(RendererFactory::GetStatistics().textures, 1) << "the clear waits in the list";
+    RendererFactory::Flush();
+    EXPECT_EQ(RendererFactory::GetStatistics().textures, 0);
+    EXPECT_EQ(RendererFactory::GetStatistics().frameBuffers, 0);
+}
+
+TEST_F(RecorderTest, ADrawThatTheListHasNoMemoryForIsLostAndThoseBeforeItAreNot) {
+    SetVertices({0, 1, 2, 3});
+    detail::RecorderObserver* const observer = std::exchange(detail::theObserver, nullptr);
+    IRasterizerState* const rasterizer = RendererFactory::GetRasterizerState();
+    rasterizer->SetScissorEnabled(true);
+    int drawn = graphics->Draw(0, -1, 1) ? 1 : 0;
+    int lost = 0;
+    for (int i = 0; lost == 0 && i < 1000; ++i) {
+        rasterizer->SetScissorRect({i, 0, 1, 1}); // so that no two draws are one
+        FailAllocations const failing;
+        ++(graphics->Draw(0, -1, 1) ? drawn : lost);
+    }
+    EXPECT_EQ(lost, 1);
+    EXPECT_EQ(RendererFactory::GetStatistics().draws, static_cast<std::uint64_t>(drawn));
+    SetVertices({0, 1, 2, 3});
+    EXPECT_TRUE(graphics->Draw(0, -1, 1));
+    RendererFactory::Flush();
+    EXPECT_EQ(RendererFactory::GetStatistics().draws, static_cast<std::uint64_t>(drawn + 1));
+    detail::theObserver = observer;
+}
+
+} // namespace
+} // namespace Moka::Testing
