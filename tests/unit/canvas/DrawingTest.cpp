@@ -174,42 +174,6 @@ TEST_F(Drawing, ADrawableThatThrowsLeavesNoTargetClipOrReferenceBehind) {
 
 // When the vertices of a new drawable are refused, memory runs out for the rest of its making: for its shader,
 // which throws. A rectangle's exists already, because the clip has it.
-TEST_F(Drawing, ADrawableWhoseConstructionThrowsIsTriedAgainAndNothingIsKept) {
-    auto const source = NewBitmap(4, 4);
-    std::vector<PointF> const points{{1, 1}, {9, 9}};
-    std::function<void()> const requests[] = {
-        [&] { canvas->DrawLine(1, 1, 9, 9, &paint); },
-        [&] { canvas->DrawSimpleLines(points, &paint); },
-        [&] { canvas->DrawRoundRect(1, 1, 9, 9, 2, 2, &paint); },
-        [&] { canvas->DrawCircle(9, 9, 3, &paint); },
-        [&] { canvas->DrawBitmap(source.Get(), 0, 0, &paint); },
-        [&] { canvas->DrawBitmaps(source.Get(), {RectF(1, 1, 5, 5)}, &paint); },
-    };
-    for (auto const& request : requests) {
-        Use(target);
-        canvas->SetClipRect(0, 0, 50, 50, IMKCanvasBase::Intersect);
-        request();
-        bool thrown = false;
-        // Out of the drawable's constructor, where its program is new to the manager.
-        LogSink const previous = SetLogSink([&](LogLine const& line) {
-            if (line.format.find("is added") != std::string::npos) throw std::bad_alloc();
-        });
-        try {
-            queue.RunAll();
-        } catch (std::bad_alloc const&) {
-            thrown = true;
-        }
-        SetLogSink(previous);
-        RendererTrace::DeclareNoRenderThread();
-        EXPECT_TRUE(thrown);
-        EXPECT_EQ(RendererTrace::CountCalls("Activate"), 0);
-        EXPECT_EQ(CountOf(source.Get()), 1);
-        request();
-        EXPECT_THAT(TakeDraws(), ::testing::Not(IsEmpty()));
-        EXPECT_EQ(CountOf(source.Get()), 1);
-    }
-}
-
 TEST_F(Drawing, ClearingGivesItsTargetBackAndClearingAllLeavesTheScissorOff) {
     canvas->SetClipRect(10, 50, 20, 30, IMKCanvasBase::Intersect);
     canvas->Clear(0.25f, 0.5f, 0.75f, 1);

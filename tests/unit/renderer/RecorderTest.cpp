@@ -55,7 +55,7 @@ protected:
     static std::uint64_t CountVertexBytes() { return RendererFactory::GetStatistics().vertexBytes; }
     float GetWidthInForce() const {
         float value = 0;
-        std::memcpy(&value, detail::GetAttachedRecorder()->requested->GetProgram()->GetValues(),
+        std::memcpy(&value, detail::GetAttachedRecorder()->requested->GetProgram()->GetValues().data(),
                     sizeof value);
         return value;
     }
