@@ -1,5 +1,6 @@
 #include "apps/moka/Batch.h"
 
+#include "apps/moka/Arguments.h"
 #include "apps/moka/Failure.h"
 #include "apps/moka/Interruption.h"
 #include "apps/moka/LogCollector.h"
@@ -13,6 +14,7 @@
 #include "moka/graphics/loader/MKBitmapSaveManager.h"
 #include "moka/host/RenderThread.h"
 
+#include <atomic>
 #include <chrono>
 #include <memory>
 #include <mutex>
@@ -50,6 +52,7 @@ private:
     void Tell(Job& job, News news);
     std::vector<Job*> TakeTold();
     void Drive();
+    std::string TellCount() const;
     void StartNext();
     void Start(Job& job);
     void GoOn(Job& job);
@@ -69,6 +72,7 @@ private:
     std::size_t mNext = 0;
     int mInFlight = 0;
     int mDone = 0;
+    std::atomic<int> mConverted{0};
 
     std::mutex mMutex;
     std::vector<Job*> mTold; // those with news, in their order; room for all, so that telling never fails
@@ -101,18 +105,27 @@ MKBitmapLoader::Callback Batch::MakeCallback() {
 
 BatchResult Batch::Run() {
     auto const start = std::chrono::steady_clock::now();
-    mQueue = StartQueue(mRequest.options, mEnv.log);
+    mQueue = StartQueue(mRequest.options, mEnv);
+    MakeFolder(mRequest.folder);
     mQueue->Call([this] { mRenderThread = std::this_thread::get_id(); });
     if (!MKBitmapLoader::startEventLoopBySelf()) throw Failure("not enough memory for the loader's thread");
     MKBitmapLoader::Callback callback = MakeCallback();
     mLoader.emplace("moka", &callback);
+    mEnv.interruption.SetLastWords([this] { return "interrupted; " + TellCount(); });
     Drive();
+    mEnv.interruption.SetLastWords({});
 
     BatchResult result;
     for (Job& job : mJobs)
         if (!job.error.empty()) result.errors.push_back(std::move(job.error));
+    if (mConverted == 0) rmdir(mRequest.folder.c_str()); // what is not empty stays
     result.seconds = std::chrono::duration<double>(std::chrono::steady_clock::now() - start).count();
     return result;
+}
+
+std::string Batch::TellCount() const {
+    return std::to_string(mConverted) + " of " + std::to_string(mJobs.size()) + " images are in " +
+           mRequest.folder;
 }
 
 void Batch::Drive() {
@@ -165,7 +178,7 @@ void Batch::Start(Job& job) {
     try {
         ConversionOptions const& options = mRequest.options;
         CheckWidth(file.input, ReadInfo(file.input, mEnv.log), options, *mQueue);
-        String const path(file.input);
+        String const path = String::FromFileName(file.input);
         if (!mLoader->RequestLoad(IdOf(job), path, mQueue.get(), options.width, options.height))
             FailJob(job, file.input + ": not enough memory to load it");
     } catch (Failure const& failure) {
@@ -211,7 +224,7 @@ void Batch::Save(Job& job) {
 
     job.saving.emplace(mEnv.interruption);
     MKBitmapSaveManager::SaveCallback callback{OnSaved, OnSaveFailed, this, &job};
-    if (!mSaveManager.RequestSave(IdOf(job), String(file.output), *bitmap, &callback,
+    if (!mSaveManager.RequestSave(IdOf(job), String::FromFileName(file.output), *bitmap, &callback,
                                   mRequest.options.quality))
         throw Failure(file.input + ": not enough memory to read it back");
     // The GPU's errors do not tell which bitmap they are about. That of an upload in between is taken for one
@@ -235,6 +248,10 @@ void Batch::FailJob(Job& job, std::string const& error) {
 void Batch::Finish(Job& job) {
     job.saving.reset();
     --mInFlight;
+    if (job.error.empty()) {
+        ++mConverted;
+        mEnv.progress.Tell(FileOf(job).input + " -> " + FileOf(job).output);
+    }
     mEnv.progress.SetCount(++mDone, static_cast<int>(mJobs.size()));
 }
 

@@ -27,19 +27,19 @@ void CheckUpload(IMKBitmap& bitmap, std::string const& name, LogCollector const&
 }
 
 BitmapPtr Upload(ConversionRequest const& request, RenderThread& queue, ConversionEnvironment const& env) {
-    String const path(request.input);
+    String const path = String::FromFileName(request.input.GetPath());
     env.progress.SetStage("decode");
     BitmapPtr bitmap = BitmapPtr::Adopt(
         MKGraphicsFactory::CreateBitmap(&queue, &path, request.options.width, request.options.height, 1));
-    if (!bitmap) env.log.Throw("cannot load " + request.input);
+    if (!bitmap) env.log.Throw("cannot load " + request.input.GetPath());
     env.progress.SetStage("upload");
     queue.WaitForTasks();
-    CheckUpload(*bitmap, request.input, env.log);
+    CheckUpload(*bitmap, request.input.GetName(), env.log);
 
     BitmapPtr clone = BitmapPtr::Adopt(bitmap->Clone());
-    if (!clone) env.log.Throw(request.input + ": not enough memory to share it");
+    if (!clone) env.log.Throw(request.input.GetName() + ": not enough memory to share it");
     queue.WaitForTasks();
-    CheckUpload(*clone, request.input, env.log);
+    CheckUpload(*clone, request.input.GetName(), env.log);
     return clone;
 }
 
@@ -55,31 +55,40 @@ void ReadBack(IMKBitmap& source, std::string const& name, Bitmap& image, LogColl
 }
 
 void Save(Bitmap const& image, ConversionRequest const& request, ConversionEnvironment const& env) {
-    String const path(request.output);
+    String const path = String::FromFileName(request.output.GetPath());
     env.progress.SetStage("encode");
     Interruption::Saving const saving(env.interruption);
     if (!BitmapFactory::SaveBitmap(&image, &path, request.options.quality))
-        env.log.Throw("cannot save " + request.output);
+        env.log.Throw("cannot save " + request.output.GetPath());
+    request.output.Take();
+}
+
+ConversionResult ConvertFile(ConversionRequest const& request, ConversionEnvironment const& env) {
+    ConversionResult result;
+    result.input = ReadInfo(request.input.GetPath(), env.log);
+    Bitmap image;
+    {
+        std::unique_ptr<RenderThread> const queue = StartQueue(request.options, env);
+        CheckWidth(request.input.GetName(), result.input, request.options, *queue);
+        BitmapPtr const bitmap = Upload(request, *queue, env);
+        env.progress.SetStage("read back");
+        ReadBack(*bitmap, request.input.GetName(), image, env.log);
+        result.strips = bitmap->GetTextureBitmap()->GetSubBitmapCount();
+        result.renderer = queue->GetContextInfo().renderer;
+    }
+    Save(image, request, env);
+    result.output = ReadInfo(request.output.GetPath(), env.log);
+    return result;
 }
 
 } // namespace
 
 ConversionResult Convert(ConversionRequest const& request, ConversionEnvironment const& env) {
-    ConversionResult result;
-    result.input = ReadInfo(request.input, env.log);
-    Bitmap image;
-    {
-        std::unique_ptr<RenderThread> const queue = StartQueue(request.options, env.log);
-        CheckWidth(request.input, result.input, request.options, *queue);
-        BitmapPtr const bitmap = Upload(request, *queue, env);
-        env.progress.SetStage("read back");
-        ReadBack(*bitmap, request.input, image, env.log);
-        result.strips = bitmap->GetTextureBitmap()->GetSubBitmapCount();
-        result.renderer = queue->GetContextInfo().renderer;
+    try {
+        return ConvertFile(request, env);
+    } catch (Failure const& failure) {
+        throw Failure(static_cast<ExitStatus>(failure.GetStatus()), request.input.Explain(failure.what()));
     }
-    Save(image, request, env);
-    result.output = ReadInfo(request.output, env.log);
-    return result;
 }
 
 } // namespace Moka::Tool

@@ -7,6 +7,8 @@
 #include "apps/moka/LogCollector.h"
 #include "apps/moka/Progress.h"
 #include "apps/moka/SceneDrawing.h"
+#include "apps/moka/StandardStreams.h"
+#include "apps/moka/Text.h"
 
 #include <CLI/CLI.hpp>
 #include <algorithm>
@@ -97,13 +99,6 @@ void DrawAll(Gallery& gallery, LogCollector& log, Progress& progress) {
     }
 }
 
-void MakeFolder(std::string const& folder) {
-    std::error_code error;
-    fs::create_directories(folder, error);
-    if (error) throw Failure("cannot make the folder " + folder + ": " + error.message());
-    CheckFolder(folder, folder, ExitStatus::Failed);
-}
-
 // Under its name only when it is whole. The other name is one that Interruption knows.
 void SavePage(std::string const& page, std::string const& folder, Interruption& interruption) {
     fs::path const path = fs::path(folder) / "index.html";
@@ -121,11 +116,14 @@ void SavePage(std::string const& page, std::string const& folder, Interruption& 
 
 void SaveAll(Gallery const& gallery, std::string const& folder, LogCollector const& log,
              Interruption& interruption) {
-    for (std::size_t i = 0; i < gallery.pictures.size(); ++i)
-        SavePicture(gallery.pixels[i], (fs::path(folder) / (gallery.pictures[i].GetName() + ".png")).string(),
-                    log, interruption);
+    for (std::size_t i = 0; i < gallery.pictures.size(); ++i) {
+        OutputFile file((fs::path(folder) / (gallery.pictures[i].GetName() + ".png")).string(), "png");
+        SavePicture(gallery.pixels[i], file, log, interruption);
+    }
     SavePage(MakeGalleryPage(gallery.pictures, gallery.device), folder, interruption);
 }
+
+void PrintPath(fs::path const& path) { std::printf("%s\n", MakePrintable(path.string()).c_str()); }
 
 // Everything is drawn before anything is written, so that a failure leaves no half of a gallery.
 void RunGallery(GalleryOptions const& options) {
@@ -139,15 +137,15 @@ void RunGallery(GalleryOptions const& options) {
     {
         Interruption interruption;
         LogCollector log(false);
-        Progress progress(true);
+        Progress progress(Progress::Line);
         DrawAll(gallery, log, progress);
         progress.SetStage("save the pictures");
         MakeFolder(options.folder);
         SaveAll(gallery, options.folder, log, interruption);
     }
     for (GalleryPicture const& picture : gallery.pictures)
-        std::printf("%s\n", (fs::path(options.folder) / (picture.GetName() + ".png")).c_str());
-    std::printf("%s\n", (fs::path(options.folder) / "index.html").c_str());
+        PrintPath(fs::path(options.folder) / (picture.GetName() + ".png"));
+    PrintPath(fs::path(options.folder) / "index.html");
 }
 
 } // namespace

@@ -5,6 +5,7 @@
 #include "apps/moka/Interruption.h"
 #include "apps/moka/LogCollector.h"
 #include "apps/moka/PenStroke.h"
+#include "apps/moka/StandardStreams.h"
 #include "moka/base/Bitmap.h"
 #include "moka/base/BitmapFactory.h"
 #include "moka/base/String.h"
@@ -37,15 +38,17 @@ Scenes::Picture DrawOnGpu(Scenes::Scene const& scene, RenderThread& queue, LogCo
     }
 }
 
-void SavePicture(Scenes::Picture const& picture, std::string const& path, LogCollector const& log,
+void SavePicture(Scenes::Picture const& picture, OutputFile& output, LogCollector const& log,
                  Interruption& interruption) {
     Bitmap image;
     // Only read; the bitmap has no constant form.
     image.Construct(const_cast<unsigned char*>(picture.pixels.data()), picture.width, picture.height,
                     static_cast<int>(picture.GetStride()), Bitmap::kFormatRgba8888, false, false);
-    String const name(path);
+    std::string const path = output.GetPath();
+    String const name = String::FromFileName(path);
     Interruption::Saving const saving(interruption);
     if (!BitmapFactory::SaveBitmap(&image, &name, GetUsualQuality(path))) log.Throw("cannot save " + path);
+    output.Take();
 }
 
 } // namespace Moka::Tool

@@ -12,6 +12,7 @@ namespace Moka::Tool {
 
 class Interruption;
 class LogCollector;
+class OutputFile;
 
 // Clears the log.
 std::unique_ptr<RenderThread> StartForScene(RenderThreadOptions const& options, LogCollector& log);
@@ -19,7 +20,7 @@ std::unique_ptr<RenderThread> StartForScene(RenderThreadOptions const& options, 
 Scenes::Picture DrawOnGpu(Scenes::Scene const& scene, RenderThread& queue, LogCollector const& log);
 
 // In the format of the extension: JPEG at quality 90, the others with every pixel.
-void SavePicture(Scenes::Picture const& picture, std::string const& path, LogCollector const& log,
+void SavePicture(Scenes::Picture const& picture, OutputFile& output, LogCollector const& log,
                  Interruption& interruption);
 
 } // namespace Moka::Tool
