@@ -41,6 +41,9 @@ struct Job {
 class Batch {
 public:
     Batch(BatchRequest const& request, ConversionEnvironment const& env);
+    ~Batch() { mEnv.interruption.SetLastWords({}); }
+    Batch(Batch const&) = delete;
+    Batch& operator=(Batch const&) = delete;
     BatchResult Run();
 
 private:
@@ -113,7 +116,6 @@ BatchResult Batch::Run() {
     mLoader.emplace("moka", &callback);
     mEnv.interruption.SetLastWords([this] { return "interrupted; " + TellCount(); });
     Drive();
-    mEnv.interruption.SetLastWords({});
 
     BatchResult result;
     for (Job& job : mJobs)

@@ -8,6 +8,7 @@
 #include <cstring>
 #include <fcntl.h>
 #include <filesystem>
+#include <random>
 #include <sys/mman.h>
 #include <unistd.h>
 #include <vector>
@@ -31,6 +32,14 @@ bool WriteAll(int file, char const* data, std::size_t count) {
         count -= static_cast<std::size_t>(written);
     }
     return true;
+}
+
+// Nobody can put a link there beforehand whose target would be written to.
+std::string MakeSecret() {
+    std::random_device random;
+    std::string secret;
+    for (int i = 0; i < 4; ++i) secret += std::to_string(random());
+    return secret;
 }
 
 // Copies until the end. False with errno.
@@ -80,7 +89,7 @@ OutputFile::OutputFile(std::string const& name, std::string const& format)
     std::error_code error;
     std::filesystem::path const folder = std::filesystem::temp_directory_path(error);
     if (error) throw Failure("there is no folder for temporary files; name one as TMPDIR");
-    mPath = (folder / ("moka-" + std::to_string(getpid()) + "." + format)).string();
+    mPath = (folder / ("moka-" + MakeSecret() + "." + format)).string();
 }
 
 OutputFile::~OutputFile() {
