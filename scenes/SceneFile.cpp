@@ -22,7 +22,7 @@ namespace fs = std::filesystem;
 
 using Kind = SceneValue::Kind;
 
-constexpr int kMaxSide = 16384;
+constexpr int kMaxSide = BitmapFactory::kMaxSide;
 constexpr int kMaxPictureSide = 4096;
 constexpr std::size_t kMaxBitmaps = 64;
 constexpr std::int64_t kMaxPicturePixels = std::int64_t{64} << 20; // 256 MiB
@@ -136,6 +136,9 @@ void ReadSize(SceneFields& fields, Scene& scene) {
     ReadFloats(size, 2, "[width, height]");
     scene.width = ReadInt(size.items[0], 1, kMaxSide);
     scene.height = ReadInt(size.items[1], 1, kMaxSide);
+    if (std::uint64_t{4} * static_cast<unsigned>(scene.width) * static_cast<unsigned>(scene.height) >
+        BitmapFactory::kMaxBytes)
+        throw SceneValueError(size, ": more than 1 GiB of pixels");
 }
 
 Scene ReadScene(SceneValue const& root, std::string const& folder) {

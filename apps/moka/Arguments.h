@@ -7,16 +7,16 @@
 
 namespace Moka::Tool {
 
-// Returns what is wrong, empty when nothing. The library's paths are UTF-8; any other byte would name another
-// file.
+// Returns what is wrong, empty when nothing.
 std::string CheckPath(std::string const& path);
+// The same of a format's name, which is an extension.
+std::string CheckFormat(std::string const& format);
 
-// Throws Failure, which begins with subject, unless files can be made in the folder. missing is the status
-// when there is no such folder.
-void CheckFolder(std::string const& subject, std::string const& folder, ExitStatus missing);
+// Makes the folder where it is missing, with those above it. Throws Failure unless files can be made in it.
+void MakeFolder(std::string const& folder);
 
 // Before any work, so that nobody waits for what cannot be saved: throws Failure unless a file of this name
-// can be written and its extension says the format.
+// can be written and its extension says the format. "-" is well.
 void CheckOutput(std::string const& output);
 
 // What a picture of this name is saved with when nobody says: 90 as JPEG, else every pixel.

@@ -1,5 +1,6 @@
 #include "apps/moka/Batch.h"
 
+#include "apps/moka/Arguments.h"
 #include "apps/moka/Failure.h"
 #include "apps/moka/Interruption.h"
 #include "apps/moka/LogCollector.h"
@@ -13,11 +14,13 @@
 #include "moka/graphics/task/ITask.h"
 #include "moka/host/RenderThread.h"
 
+#include <atomic>
 #include <chrono>
 #include <memory>
 #include <mutex>
 #include <new>
 #include <optional>
+#include <unistd.h>
 #include <utility>
 
 namespace Moka::Tool {
@@ -59,6 +62,9 @@ std::string ReasonIn(std::string line) {
 class Batch {
 public:
     Batch(BatchRequest const& request, ConversionEnvironment const& env);
+    ~Batch() { mEnv.interruption.SetLastWords({}); }
+    Batch(Batch const&) = delete;
+    Batch& operator=(Batch const&) = delete;
     BatchResult Run();
 
 private:
@@ -70,6 +76,7 @@ private:
     void TellWithReason(int id, News news);
     std::vector<Job*> TakeTold();
     void Drive();
+    std::string TellCount() const;
     void StartNext();
     void Start(Job& job);
     void GoOn(Job& job);
@@ -89,6 +96,7 @@ private:
     std::size_t mNext = 0;
     int mInFlight = 0;
     int mDone = 0;
+    std::atomic<int> mConverted{0};
 
     std::mutex mMutex;
     std::vector<Job*> mTold; // those with news, in their order; room for all, so that telling never fails
@@ -122,17 +130,25 @@ MKBitmapLoader::Callback Batch::MakeCallback() {
 
 BatchResult Batch::Run() {
     auto const start = std::chrono::steady_clock::now();
-    mQueue = StartQueue(mRequest.options, mEnv.log);
+    mQueue = StartQueue(mRequest.options, mEnv);
+    MakeFolder(mRequest.folder);
     if (!MKBitmapLoader::startEventLoopBySelf()) throw Failure("not enough memory for the loader's thread");
     MKBitmapLoader::Callback callback = MakeCallback();
     mLoader.emplace("moka", &callback);
+    mEnv.interruption.SetLastWords([this] { return "interrupted; " + TellCount(); });
     Drive();
 
     BatchResult result;
     for (Job& job : mJobs)
         if (!job.error.empty()) result.errors.push_back(std::move(job.error));
+    if (mConverted == 0) rmdir(mRequest.folder.c_str()); // what is not empty stays
     result.seconds = std::chrono::duration<double>(std::chrono::steady_clock::now() - start).count();
     return result;
+}
+
+std::string Batch::TellCount() const {
+    return std::to_string(mConverted) + " of " + std::to_string(mJobs.size()) + " images are in " +
+           mRequest.folder;
 }
 
 void Batch::Drive() {
@@ -192,7 +208,7 @@ void Batch::Start(Job& job) {
     try {
         ConversionOptions const& options = mRequest.options;
         CheckWidth(file.input, ReadInfo(file.input), options, *mQueue);
-        String const path(file.input);
+        String const path = String::FromFileName(file.input);
         if (!mLoader->RequestLoad(IdOf(job), path, mQueue.get(), options.width, options.height))
             FailJob(job, file.input + ": not enough memory to load it");
     } catch (Failure const& failure) {
@@ -243,8 +259,8 @@ void Batch::Save(Job& job) {
     CheckStrips(*bitmap, file.input);
     if (!job.reason.empty()) throw Failure(file.input + ": cannot be read back from the GPU: " + job.reason);
     job.saving.emplace(mEnv.interruption);
-    if (!mLoader->RequestSave(IdOf(job), String(file.output), job.pixels.get(), bitmap->GetWidth(),
-                              bitmap->GetHeight(), nullptr, mRequest.options.quality))
+    if (!mLoader->RequestSave(IdOf(job), String::FromFileName(file.output), job.pixels.get(),
+                              bitmap->GetWidth(), bitmap->GetHeight(), nullptr, mRequest.options.quality))
         throw Failure(file.input + ": not enough memory to save it");
     static_cast<void>(job.pixels.release()); // the loader's now
 }
@@ -259,6 +275,10 @@ void Batch::Finish(Job& job) {
     job.bitmap = {};
     job.pixels.reset();
     --mInFlight;
+    if (job.error.empty()) {
+        ++mConverted;
+        mEnv.progress.Tell(FileOf(job).input + " -> " + FileOf(job).output);
+    }
     mEnv.progress.SetCount(++mDone, static_cast<int>(mJobs.size()));
 }
 

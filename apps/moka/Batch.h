@@ -2,7 +2,7 @@
 // thread uploads and reads back, the calling thread drives them.
 // Thread:  once in a process, on a thread without a message loop. The loader's thread sleeps on afterwards.
 // Fails:   a file that cannot be converted stops no other; its output then is what it was before. Throws
-//          Failure when nothing can be converted at all.
+//          Failure when nothing can be converted at all. An interruption tells how many files were done.
 // Memory:  no more than the given number of images, each in at most two copies.
 #pragma once
 
@@ -16,6 +16,7 @@ namespace Moka::Tool {
 
 struct BatchRequest {
     std::vector<BatchFile> files;
+    std::string folder; // made once there is a driver, and removed again when nothing came into it
     ConversionOptions options;
     int inFlight = 1;
 };

@@ -11,11 +11,8 @@ struct BatchFile {
     std::string output;
 };
 
-// What is wrong with the name of a format, empty when nothing.
-std::string CheckFormat(std::string const& format);
-
-// Each input's name, with format as its extension, in folder. Throws Failure when the folder cannot be
-// written to or two inputs would become one file.
+// Each input's name, with format as its extension, in folder. Throws Failure when two inputs would become one
+// file.
 std::vector<BatchFile> PlanBatch(std::vector<std::string> const& inputs, std::string const& format,
                                  std::string const& folder);
 

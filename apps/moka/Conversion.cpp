@@ -28,16 +28,16 @@ void CheckUpload(IMKBitmap& bitmap, std::string const& name, LogCollector const&
 
 // The pixels, which are freed behind the upload.
 BitmapPtr Decode(ConversionRequest const& request, RenderThread& queue) {
-    String const path(request.input);
+    String const path = String::FromFileName(request.input.GetPath());
     ConversionOptions const& options = request.options;
     std::string reason;
     std::unique_ptr<Bitmap> const decoded(
         options.width != 0 ? BitmapFactory::CreateBitmap(&path, options.width, options.height, &reason)
                            : BitmapFactory::CreateBitmapForGraphics(&path, &reason));
-    if (!decoded) throw Failure(TellCannot("read", request.input, reason));
+    if (!decoded) throw Failure(TellCannot("read", request.input.GetPath(), reason));
     BitmapPtr bitmap = BitmapPtr::Adopt(MKGraphicsFactory::CreateBitmap(
         &queue, decoded->GetWidth(), decoded->GetHeight(), decoded->GetBuffer(), true, 1, false));
-    if (!bitmap) throw Failure(request.input + ": not enough memory to load it");
+    if (!bitmap) throw Failure(request.input.GetName() + ": not enough memory to load it");
     decoded->SetDeleteBuffer(false);
     return bitmap;
 }
@@ -47,12 +47,12 @@ BitmapPtr Upload(ConversionRequest const& request, RenderThread& queue, Conversi
     BitmapPtr bitmap = Decode(request, queue);
     env.progress.SetStage("upload");
     queue.WaitForTasks();
-    CheckUpload(*bitmap, request.input, env.log);
+    CheckUpload(*bitmap, request.input.GetName(), env.log);
 
     BitmapPtr clone = BitmapPtr::Adopt(bitmap->Clone());
-    if (!clone) env.log.Throw(request.input + ": not enough memory to share it");
+    if (!clone) env.log.Throw(request.input.GetName() + ": not enough memory to share it");
     queue.WaitForTasks();
-    CheckUpload(*clone, request.input, env.log);
+    CheckUpload(*clone, request.input.GetName(), env.log);
     return clone;
 }
 
@@ -68,32 +68,41 @@ void ReadBack(IMKBitmap& source, std::string const& name, Bitmap& image, LogColl
 }
 
 void Save(Bitmap const& image, ConversionRequest const& request, ConversionEnvironment const& env) {
-    String const path(request.output);
+    String const path = String::FromFileName(request.output.GetPath());
     env.progress.SetStage("encode");
     Interruption::Saving const saving(env.interruption);
     std::string reason;
     if (!BitmapFactory::SaveBitmap(&image, &path, request.options.quality, &reason))
-        throw Failure(TellCannot("save", request.output, reason));
+        throw Failure(TellCannot("save", request.output.GetPath(), reason));
+    request.output.Take();
+}
+
+ConversionResult ConvertFile(ConversionRequest const& request, ConversionEnvironment const& env) {
+    ConversionResult result;
+    result.input = ReadInfo(request.input.GetPath());
+    Bitmap image;
+    {
+        std::unique_ptr<RenderThread> const queue = StartQueue(request.options, env);
+        CheckWidth(request.input.GetName(), result.input, request.options, *queue);
+        BitmapPtr const bitmap = Upload(request, *queue, env);
+        env.progress.SetStage("read back");
+        ReadBack(*bitmap, request.input.GetName(), image, env.log);
+        result.strips = bitmap->GetTextureBitmap()->GetSubBitmapCount();
+        result.renderer = queue->GetContextInfo().renderer;
+    }
+    Save(image, request, env);
+    result.output = ReadInfo(request.output.GetPath());
+    return result;
 }
 
 } // namespace
 
 ConversionResult Convert(ConversionRequest const& request, ConversionEnvironment const& env) {
-    ConversionResult result;
-    result.input = ReadInfo(request.input);
-    Bitmap image;
-    {
-        std::unique_ptr<RenderThread> const queue = StartQueue(request.options, env.log);
-        CheckWidth(request.input, result.input, request.options, *queue);
-        BitmapPtr const bitmap = Upload(request, *queue, env);
-        env.progress.SetStage("read back");
-        ReadBack(*bitmap, request.input, image, env.log);
-        result.strips = bitmap->GetTextureBitmap()->GetSubBitmapCount();
-        result.renderer = queue->GetContextInfo().renderer;
+    try {
+        return ConvertFile(request, env);
+    } catch (Failure const& failure) {
+        throw Failure(static_cast<ExitStatus>(failure.GetStatus()), request.input.Explain(failure.what()));
     }
-    Save(image, request, env);
-    result.output = ReadInfo(request.output);
-    return result;
 }
 
 } // namespace Moka::Tool

@@ -4,14 +4,15 @@
 #pragma once
 
 #include "apps/moka/ConversionSteps.h"
+#include "apps/moka/StandardStreams.h"
 
 #include <string>
 
 namespace Moka::Tool {
 
 struct ConversionRequest {
-    std::string input;
-    std::string output;
+    InputFile const& input;
+    OutputFile& output;
     ConversionOptions options;
 };
 

@@ -2,6 +2,7 @@
 
 #include "apps/moka/Failure.h"
 #include "apps/moka/LogCollector.h"
+#include "apps/moka/Progress.h"
 #include "moka/base/String.h"
 #include "moka/graphics/bitmap/IMKBitmap.h"
 #include "moka/graphics/bitmap/IMKSubBitmap.h"
@@ -15,21 +16,24 @@
 namespace Moka::Tool {
 namespace {
 
-std::string TellLimit(RenderThread const& queue) {
-    return "this device takes textures up to " + std::to_string(queue.GetContextInfo().maxTextureSize);
+// An image is cut into strips of its whole width.
+std::string TellLimit(ConversionOptions const& options, RenderThread const& queue) {
+    std::string const largest = std::to_string(queue.GetContextInfo().maxTextureSize);
+    return options.maxTextureSize > 0 ? "--max-texture " + largest + " limits the width, too"
+                                      : "this device takes textures up to " + largest;
 }
 
 } // namespace
 
 ImageInfo ReadInfo(std::string const& path) {
-    String const text(path);
+    String const text = String::FromFileName(path);
     ImageInfo info;
     std::string reason;
     if (BitmapFactory::GetImageInfo(&text, &info, &reason)) return info;
     throw Failure(TellCannot("read", path, reason));
 }
 
-std::unique_ptr<RenderThread> StartQueue(ConversionOptions const& options, LogCollector& log) {
+std::unique_ptr<RenderThread> StartQueue(ConversionOptions const& options, ConversionEnvironment const& env) {
     // There is no Java in this process.
     MKBitmapFactory_UseNativeDecoder();
     RenderThreadOptions threadOptions;
@@ -39,9 +43,10 @@ std::unique_ptr<RenderThread> StartQueue(ConversionOptions const& options, LogCo
     if (!queue) throw Failure(error);
     if (options.width > queue->GetContextInfo().maxTextureSize)
         throw Failure("--size asks for " + std::to_string(options.width) + " pixels across; " +
-                      TellLimit(*queue));
+                      TellLimit(options, *queue));
     // What was tried in vain before a driver answered is no failure.
-    log.Clear();
+    env.log.Clear();
+    env.progress.Tell(queue->GetContextInfo().renderer + ", " + queue->GetContextInfo().path);
     return queue;
 }
 
@@ -51,8 +56,10 @@ void CheckWidth(std::string const& input, ImageInfo const& info, ConversionOptio
     int const largest = queue.GetContextInfo().maxTextureSize;
     if (options.width != 0 || info.width <= largest) return;
     std::int64_t const height = std::max<std::int64_t>(1, std::int64_t{info.height} * largest / info.width);
-    throw Failure(input + " is " + std::to_string(info.width) + " pixels wide; " + TellLimit(queue) +
-                  "; scale it, for instance with --size " + std::to_string(largest) + "x" +
+    bool const isChosen = options.maxTextureSize > 0;
+    throw Failure(input + " is " + std::to_string(info.width) + " pixels wide; " + TellLimit(options, queue) +
+                  (isChosen ? "; name at least " + std::to_string(info.width) + ", or" : ";") +
+                  " scale it, for instance with --size " + std::to_string(largest) + "x" +
                   std::to_string(height));
 }
 

@@ -34,7 +34,7 @@ struct ConversionEnvironment {
 ImageInfo ReadInfo(std::string const& path);
 
 // Also refuses a size that no texture of the device can be made for. Clears the log.
-std::unique_ptr<RenderThread> StartQueue(ConversionOptions const& options, LogCollector& log);
+std::unique_ptr<RenderThread> StartQueue(ConversionOptions const& options, ConversionEnvironment const& env);
 
 // Refuses an image that is loaded in its own size and is wider than a texture may be.
 void CheckWidth(std::string const& input, ImageInfo const& info, ConversionOptions const& options,

@@ -7,6 +7,8 @@
 #include "apps/moka/Interruption.h"
 #include "apps/moka/LogCollector.h"
 #include "apps/moka/Progress.h"
+#include "apps/moka/StandardStreams.h"
+#include "apps/moka/Text.h"
 
 #include <CLI/CLI.hpp>
 #include <cstdint>
@@ -21,12 +23,15 @@ namespace {
 constexpr int kUnset = -1;
 constexpr int kInFlight = 4;
 constexpr int kMaxInFlight = 64;
+constexpr char kUsualFormat[] = "png";
 
 constexpr char kDescription[] = "Convert between PNG, JPEG, WebP and mki, through the GPU";
 constexpr char kFooter[] =
     "One file into another:        moka convert photo.jpg page.mki\n"
-    "Many files into a folder:     moka convert *.jpg --to mki --out pages\n\n"
-    "The input's format follows from its content, the output's from its extension, or with --to from that.\n"
+    "Many files into a folder:     moka convert *.jpg --to mki --out pages\n"
+    "Through a pipe:               moka convert - - --to webp <photo.jpg >photo.webp\n\n"
+    "The input's format follows from its content, the output's from its extension, or with --to from that;\n"
+    "standard output (-) gets a PNG unless --to says another.\n"
     "An image is decoded, uploaded, read back and encoded. PNG, mki and WebP keep every pixel,\n"
     "unless WebP is given a quality below 100; JPEG lays what is transparent on white.\n"
     "Of many, each keeps its name but for the extension. One that cannot be converted stops no other; it is\n"
@@ -35,8 +40,8 @@ constexpr char kFooter[] =
 struct ConvertOptions {
     std::string input;
     std::vector<std::string> others; // the output, or with a format further inputs
-    std::string format;              // empty: one file into another
-    std::string folder;
+    std::string format;              // of many, or of standard output
+    std::string folder;              // empty: one file into another
     int inFlight = kInFlight;
     ConversionOptions conversion;
     std::string size;
@@ -71,16 +76,19 @@ std::string Dimensions(ImageInfo const& info) {
 void PrintSummary(ConversionRequest const& request, ConversionResult const& result) {
     std::string const before = Dimensions(result.input);
     std::string const after = Dimensions(result.output);
-    std::printf("%s (%s %s) -> %s (%s%s, %llu bytes), %d strip%s, %s\n", request.input.c_str(),
-                BitmapFactory::GetFormatName(result.input.format), before.c_str(), request.output.c_str(),
-                BitmapFactory::GetFormatName(result.output.format),
-                before == after ? "" : (" " + after).c_str(),
-                static_cast<unsigned long long>(result.output.fileBytes), result.strips,
-                result.strips == 1 ? "" : "s", ShortName(result.renderer).c_str());
+    std::printf(
+        "%s (%s %s) -> %s (%s%s, %llu bytes), %d strip%s, %s\n",
+        MakePrintable(request.input.GetName()).c_str(), BitmapFactory::GetFormatName(result.input.format),
+        before.c_str(), MakePrintable(request.output.GetPath()).c_str(),
+        BitmapFactory::GetFormatName(result.output.format), before == after ? "" : (" " + after).c_str(),
+        static_cast<unsigned long long>(result.output.fileBytes), result.strips,
+        result.strips == 1 ? "" : "s", ShortName(result.renderer).c_str());
 }
 
 // In the words of the parser, which cannot know how many there may be.
 std::string TakeOutput(ConvertOptions const& options) {
+    if (options.others.empty() && !options.format.empty())
+        throw Failure(ExitStatus::Usage, "--to needs --out, a folder for the files, or - as the output");
     if (options.others.empty())
         throw Failure(ExitStatus::Usage, "OUTPUT is required; see moka convert --help");
     if (options.others.size() > 1)
@@ -102,24 +110,32 @@ template <class Work>
 auto RunGuarded(ConvertOptions const& options, Work const& work) {
     Interruption interruption;
     LogCollector log(options.verbose);
-    Progress progress(!options.quiet && !options.verbose);
+    Progress progress(options.verbose ? Progress::Verbose
+                      : options.quiet ? Progress::Silent
+                                      : Progress::Line);
     return work({log, progress, interruption});
 }
 
 void RunSingle(ConvertOptions const& options) {
     std::string const output = TakeOutput(options);
     CheckOutput(output);
-    ConversionRequest const request{options.input, output, Complete(options, output)};
+    if (!options.format.empty() && !IsStandardStream(output))
+        throw Failure(ExitStatus::Usage, "--to needs --out, a folder for the files, or - as the output");
+    OutputFile file(output, options.format.empty() ? kUsualFormat : options.format);
+    InputFile const input(options.input);
+    ConversionRequest const request{input, file, Complete(options, file.GetPath())};
     ConversionResult const result = RunGuarded(
         options, [&](ConversionEnvironment const& environment) { return Convert(request, environment); });
-    if (!options.quiet) PrintSummary(request, result);
+    file.Send();
+    if (!options.quiet && !file.IsStream()) PrintSummary(request, result);
 }
 
 void PrintSummary(ConvertOptions const& options, std::size_t total, BatchResult const& result) {
     bool const hasSlash = options.folder.back() == '/';
-    std::printf("%zu of %zu image%s -> %s%s (%s), %.1f files/s\n", total - result.errors.size(), total,
-                total == 1 ? "" : "s", options.folder.c_str(), hasSlash ? "" : "/", options.format.c_str(),
-                static_cast<double>(total) / result.seconds);
+    std::size_t const converted = total - result.errors.size();
+    std::printf("%zu of %zu image%s -> %s%s (%s), %.1f files/s\n", converted, total, total == 1 ? "" : "s",
+                MakePrintable(options.folder).c_str(), hasSlash ? "" : "/", options.format.c_str(),
+                static_cast<double>(converted) / result.seconds);
 }
 
 void RunBatch(ConvertOptions const& options) {
@@ -127,6 +143,7 @@ void RunBatch(ConvertOptions const& options) {
     inputs.insert(inputs.end(), options.others.begin(), options.others.end());
     BatchRequest request;
     request.files = PlanBatch(inputs, options.format, options.folder);
+    request.folder = options.folder;
     request.options = Complete(options, request.files.front().output);
     request.inFlight = options.inFlight;
     BatchResult const result = RunGuarded(options, [&](ConversionEnvironment const& environment) {
@@ -138,31 +155,32 @@ void RunBatch(ConvertOptions const& options) {
 }
 
 void AddFiles(CLI::App& command, ConvertOptions& options) {
-    command.add_option("INPUT", options.input, "The image to read")
+    command.add_option("INPUT", options.input, "The image to read; - is standard input")
         ->required()
         ->check(CLI::Validator(CheckPath, ""));
     command
         .add_option("OUTPUT", options.others,
-                    "The file to write; replaced if it exists. With --to: further images to read")
+                    "The file to write; replaced if it exists. With --out: further images to read")
         ->check(CLI::Validator(CheckPath, ""));
     CLI::Option* const format =
         command
             .add_option("--to", options.format,
-                        "Convert every file given into this format: png, jpg, jpeg, webp, mki")
+                        "The format of every file, or of standard output: png, jpg, jpeg, webp, mki")
             ->type_name("FORMAT")
             ->check(CLI::Validator(CheckFormat, ""));
     CLI::Option* const folder =
-        command.add_option("--out", options.folder, "The folder to write them to; files there are replaced")
+        command
+            .add_option("--out", options.folder,
+                        "The folder to write many files to, made if need be; files there are replaced")
             ->type_name("DIR")
             ->check(CLI::Validator(CheckPath, ""));
-    format->needs(folder);
     folder->needs(format);
     command
         .add_option("--jobs", options.inFlight,
                     "Of many files, at most N in memory at a time; 4 unless given, up to 64")
         ->type_name("N")
         ->check(CLI::Range(1, kMaxInFlight).description(""))
-        ->needs(format);
+        ->needs(folder);
 }
 
 void AddSettings(CLI::App& command, ConvertOptions& options) {
@@ -180,7 +198,7 @@ void AddSettings(CLI::App& command, ConvertOptions& options) {
         ->type_name("N")
         ->check(CLI::Range(1, BitmapFactory::kMaxSide).description(""));
     command.add_flag("-q,--quiet", options.quiet, "Print nothing but errors");
-    command.add_flag("-v,--verbose", options.verbose, "Print the library's log to stderr");
+    command.add_flag("-v,--verbose", options.verbose, "Tell on stderr what happens, with the library's log");
 }
 
 } // namespace
@@ -191,7 +209,7 @@ void AddConvertCommand(CLI::App& app) {
     command->footer(kFooter);
     AddFiles(*command, *options);
     AddSettings(*command, *options);
-    command->callback([options] { options->format.empty() ? RunSingle(*options) : RunBatch(*options); });
+    command->callback([options] { options->folder.empty() ? RunSingle(*options) : RunBatch(*options); });
 }
 
 } // namespace Moka::Tool

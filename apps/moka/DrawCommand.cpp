@@ -6,27 +6,38 @@
 #include "apps/moka/LogCollector.h"
 #include "apps/moka/Progress.h"
 #include "apps/moka/SceneDrawing.h"
+#include "apps/moka/StandardStreams.h"
+#include "apps/moka/Text.h"
+#include "apps/moka/Watch.h"
 #include "scenes/SceneError.h"
 #include "scenes/SceneFile.h"
 
 #include <CLI/CLI.hpp>
+#include <cerrno>
 #include <cstdio>
+#include <cstring>
 #include <memory>
 #include <string>
+#include <unistd.h>
 
 namespace Moka::Tool {
 namespace {
 
 constexpr char kDescription[] = "Draw a scene, described in JSON, onto a picture";
-constexpr char kFooter[] = "    moka draw scene.json -o out.png\n\n"
-                           "    {\"size\": [320, 240], \"background\": \"#FFF0E8\", \"operations\": [\n"
-                           "        {\"DrawCircle\": {\"cx\": 160, \"cy\": 120, \"radius\": 80, \"paint\": "
-                           "{\"color\": \"#2050A0\"}}}]}\n\n"
-                           "docs/scene-format.md describes the format; scenes/data has many more of them.";
+constexpr char kFooter[] =
+    "    moka draw scene.json -o out.png            once\n"
+    "    moka draw --watch scene.json -o out.png    again whenever the file changes\n\n"
+    "    {\"size\": [320, 240], \"background\": \"#FFF0E8\", \"operations\": [\n"
+    "        {\"DrawCircle\": {\"cx\": 160, \"cy\": 120, \"radius\": 80, \"paint\": "
+    "{\"color\": \"#2050A0\"}}}]}\n\n"
+    "docs/scene-format.md describes the format; scenes/data has many more of them.";
 
 struct DrawOptions {
     std::string input;
     std::string output;
+    std::string format; // of standard output
+    bool watch = false;
+    bool verbose = false;
 };
 
 Scenes::Scene Load(std::string const& path) {
@@ -37,22 +48,51 @@ Scenes::Scene Load(std::string const& path) {
     }
 }
 
-void RunDraw(DrawOptions const& options) {
-    CheckOutput(options.output);
+// Draws once, on a render thread of its own.
+void Draw(DrawOptions const& options, Interruption& interruption) {
+    OutputFile output(options.output, options.format.empty() ? "png" : options.format);
     Scenes::Picture picture;
     {
-        Interruption interruption;
-        LogCollector log(false);
-        Progress progress(true);
+        LogCollector log(options.verbose);
+        Progress progress(options.verbose ? Progress::Verbose : Progress::Line);
         progress.SetStage("read the scene");
         Scenes::Scene const scene = Load(options.input);
         progress.SetStage("draw");
         picture = DrawOnGpu(scene, *StartForScene({}, log), log);
         progress.SetStage("encode");
-        SavePicture(picture, options.output, interruption);
+        SavePicture(picture, output, interruption);
     }
-    std::printf("%s -> %s (%dx%d)\n", options.input.c_str(), options.output.c_str(), picture.width,
-                picture.height);
+    output.Send();
+    if (output.IsStream()) return;
+    std::printf("%s -> %s (%dx%d)\n", MakePrintable(options.input).c_str(),
+                MakePrintable(options.output).c_str(), picture.width, picture.height);
+    std::fflush(stdout); // whoever watches sees it at once
+}
+
+// Until it is interrupted. A mistake is told, and the last picture stays.
+[[noreturn]] void DrawAgainAndAgain(DrawOptions const& options, Interruption& interruption) {
+    for (FileWatch watch(options.input);; watch.WaitForChange()) {
+        try {
+            Draw(options, interruption);
+        } catch (Failure const& failure) {
+            PrintError(failure.what());
+        }
+    }
+}
+
+void RunDraw(DrawOptions const& options) {
+    CheckOutput(options.output);
+    if (!options.format.empty() && !IsStandardStream(options.output))
+        throw Failure(ExitStatus::Usage, "--to is for standard output (-o -); " + options.output +
+                                             " says its format by its extension");
+    bool const isStream = IsStandardStream(options.input) || IsStandardStream(options.output);
+    if (options.watch && isStream)
+        throw Failure(ExitStatus::Usage, "--watch needs the names of two files; - is none");
+    if (options.watch && access(options.input.c_str(), R_OK) != 0)
+        throw Failure("cannot read " + options.input + ": " + std::strerror(errno));
+    Interruption interruption;
+    if (options.watch) DrawAgainAndAgain(options, interruption);
+    Draw(options, interruption);
 }
 
 } // namespace
@@ -61,15 +101,24 @@ void AddDrawCommand(CLI::App& app) {
     auto const options = std::make_shared<DrawOptions>();
     CLI::App* const command = app.add_subcommand("draw", kDescription);
     command->footer(kFooter);
-    command->add_option("SCENE", options->input, "The scene's file")
+    command->add_option("SCENE", options->input, "The scene's file; - is standard input")
         ->required()
         ->check(CLI::Validator(CheckPath, ""));
     command
-        ->add_option("-o", options->output,
-                     "The picture to write, PNG, JPEG, WebP or mki by its extension; replaced if it exists")
+        ->add_option(
+            "-o", options->output,
+            "The picture to write, PNG, JPEG, WebP or mki by its extension; replaced if it exists. - is "
+            "standard output")
         ->type_name("OUTPUT")
         ->required()
         ->check(CLI::Validator(CheckPath, ""));
+    command->add_option("--to", options->format, "The format of standard output; png unless given")
+        ->type_name("FORMAT")
+        ->check(CLI::Validator(CheckFormat, ""));
+    command->add_flag("-w,--watch", options->watch,
+                      "Draw again whenever the scene's file changes, until interrupted");
+    command->add_flag("-v,--verbose", options->verbose,
+                      "Tell on stderr what happens, with the library's log");
     command->callback([options] { RunDraw(*options); });
 }
 

@@ -1,5 +1,7 @@
 #include "apps/moka/Failure.h"
 
+#include "apps/moka/Text.h"
+
 #include <cstdio>
 
 namespace Moka::Tool {
@@ -12,10 +14,7 @@ std::string TellCannot(char const* action, std::string const& path, std::string 
 }
 
 void PrintError(std::string const& message) {
-    std::string line = message.substr(0, message.find_last_not_of(" \n") + 1);
-    for (char& c : line) {
-        if (static_cast<unsigned char>(c) < ' ' || c == 0x7F) c = ' ';
-    }
+    std::string const line = MakePrintable(message.substr(0, message.find_last_not_of(" \n") + 1), ' ');
     std::fflush(stdout);
     std::fprintf(stderr, "moka: %s\n", line.c_str());
 }

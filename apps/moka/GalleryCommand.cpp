@@ -7,6 +7,8 @@
 #include "apps/moka/LogCollector.h"
 #include "apps/moka/Progress.h"
 #include "apps/moka/SceneDrawing.h"
+#include "apps/moka/StandardStreams.h"
+#include "apps/moka/Text.h"
 
 #include <CLI/CLI.hpp>
 #include <algorithm>
@@ -98,13 +100,6 @@ void DrawAll(Gallery& gallery, LogCollector& log, Progress& progress) {
     }
 }
 
-void MakeFolder(std::string const& folder) {
-    std::error_code error;
-    fs::create_directories(folder, error);
-    if (error) throw Failure("cannot make the folder " + folder + ": " + error.message());
-    CheckFolder(folder, folder, ExitStatus::Failed);
-}
-
 // Under its name only when it is whole. The other name is one that Interruption knows.
 void SavePage(std::string const& page, std::string const& folder, Interruption& interruption) {
     fs::path const path = fs::path(folder) / "index.html";
@@ -125,11 +120,15 @@ std::string GetPath(GalleryOptions const& options, GalleryPicture const& picture
 }
 
 void SaveAll(Gallery const& gallery, GalleryOptions const& options, Interruption& interruption) {
-    for (std::size_t i = 0; i < gallery.pictures.size(); ++i)
-        SavePicture(gallery.pixels[i], GetPath(options, gallery.pictures[i]), interruption);
+    for (std::size_t i = 0; i < gallery.pictures.size(); ++i) {
+        OutputFile file(GetPath(options, gallery.pictures[i]), options.mki ? "mki" : "png");
+        SavePicture(gallery.pixels[i], file, interruption);
+    }
     if (options.mki) return; // no browser shows them
     SavePage(MakeGalleryPage(gallery.pictures, gallery.device), options.folder, interruption);
 }
+
+void PrintPath(fs::path const& path) { std::printf("%s\n", MakePrintable(path.string()).c_str()); }
 
 // Everything is drawn before anything is written, so that a failure leaves no half of a gallery.
 void RunGallery(GalleryOptions const& options) {
@@ -143,16 +142,15 @@ void RunGallery(GalleryOptions const& options) {
     {
         Interruption interruption;
         LogCollector log(false);
-        Progress progress(true);
+        Progress progress(Progress::Line);
         DrawAll(gallery, log, progress);
         progress.SetStage("save the pictures");
         MakeFolder(options.folder);
         SaveAll(gallery, options, interruption);
     }
-    for (GalleryPicture const& picture : gallery.pictures)
-        std::printf("%s\n", GetPath(options, picture).c_str());
+    for (GalleryPicture const& picture : gallery.pictures) PrintPath(GetPath(options, picture));
     if (options.mki) return;
-    std::printf("%s\n", (fs::path(options.folder) / "index.html").c_str());
+    PrintPath(fs::path(options.folder) / "index.html");
 }
 
 } // namespace

@@ -3,6 +3,8 @@
 #include "apps/moka/Arguments.h"
 #include "apps/moka/Failure.h"
 #include "apps/moka/LogCollector.h"
+#include "apps/moka/StandardStreams.h"
+#include "apps/moka/Text.h"
 #include "moka/base/BitmapFactory.h"
 #include "moka/base/String.h"
 #include "moka/host/RenderThread.h"
@@ -21,19 +23,31 @@ struct InfoOptions {
     bool verbose = false;
 };
 
-bool PrintFile(std::string const& file) {
-    String const path(file);
+// What only some files have.
+std::string DescribeRest(ImageInfo const& info) {
+    std::string text;
+    if (!info.profile.empty()) text += ", profile " + info.profile;
+    if (info.orientation != 1)
+        text += ", orientation " + std::to_string(info.orientation) + " of 8 (noted, not applied)";
+    if (info.frames > 1) text += ", " + std::to_string(info.frames) + " frames (one is read)";
+    return text;
+}
+
+bool PrintFile(std::string const& name) {
+    InputFile const file(name);
+    String const path = String::FromFileName(file.GetPath());
     ImageInfo info;
     std::string reason;
     if (!BitmapFactory::GetImageInfo(&path, &info, &reason)) {
-        PrintError(TellCannot("read", file, reason));
+        PrintError(file.Explain(TellCannot("read", file.GetPath(), reason)));
         return false;
     }
     unsigned long long const decoded =
         4ULL * static_cast<unsigned>(info.width) * static_cast<unsigned>(info.height);
-    std::printf("%s: %s, %dx%d, %s, %llu bytes, %llu decoded\n", file.c_str(),
+    std::printf("%s: %s, %dx%d, %s, %llu bytes, %llu decoded%s\n", MakePrintable(file.GetName()).c_str(),
                 BitmapFactory::GetFormatName(info.format), info.width, info.height,
-                info.hasAlpha ? "alpha" : "opaque", static_cast<unsigned long long>(info.fileBytes), decoded);
+                info.hasAlpha ? "alpha" : "opaque", static_cast<unsigned long long>(info.fileBytes), decoded,
+                MakePrintable(DescribeRest(info)).c_str());
     return true;
 }
 
@@ -68,8 +82,9 @@ void RunInfo(InfoOptions const& options) {
 void AddInfoCommand(CLI::App& app) {
     auto const options = std::make_shared<InfoOptions>();
     CLI::App* const command =
-        app.add_subcommand("info", "Tell what images are: format, size, alpha, bytes on disk, bytes decoded");
-    command->add_option("FILE", options->files, "The images to look at")
+        app.add_subcommand("info", "Tell what images are: format, size, alpha, bytes on disk, bytes decoded, "
+                                   "colour profile, orientation, frames");
+    command->add_option("FILE", options->files, "The images to look at; - is standard input")
         ->check(CLI::Validator(CheckPath, ""));
     command->add_flag("--device", options->device,
                       "Tell the GPU's driver, its largest texture and how it was reached");

@@ -1,5 +1,6 @@
 #include "apps/moka/Interruption.h"
 
+#include "apps/moka/Failure.h"
 #include "apps/moka/Progress.h"
 
 #include <chrono>
@@ -9,6 +10,7 @@
 #include <string_view>
 #include <sys/resource.h>
 #include <unistd.h>
+#include <utility>
 
 namespace Moka::Tool {
 namespace {
@@ -57,6 +59,11 @@ Interruption::~Interruption() {
     if (mOpenFiles) closedir(mOpenFiles);
 }
 
+void Interruption::SetLastWords(std::function<std::string()> lastWords) {
+    std::lock_guard const lock(mMutex);
+    mLastWords = std::move(lastWords);
+}
+
 void Interruption::Enter() {
     std::lock_guard const lock(mMutex);
     ++mSavings;
@@ -103,6 +110,7 @@ bool Interruption::RemoveOpenTemporary() const {
 // By the signal itself, so that a shell sees what happened.
 void Interruption::End() const {
     Progress::EraseLine();
+    if (mLastWords) PrintError(mLastWords());
     std::signal(mSignal, SIG_DFL);
     sigset_t only;
     sigemptyset(&only);

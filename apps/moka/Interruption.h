@@ -12,7 +12,9 @@
 
 #include <csignal>
 #include <dirent.h>
+#include <functional>
 #include <mutex>
+#include <string>
 #include <thread>
 
 namespace Moka::Tool {
@@ -36,6 +38,10 @@ public:
         Interruption& mInterruption;
     };
 
+    // What is told on stderr when a signal ends the process; an empty function tells nothing. It is called on
+    // any thread.
+    void SetLastWords(std::function<std::string()> lastWords);
+
 private:
     void Enter();
     void Leave();
@@ -50,6 +56,7 @@ private:
     int mSavings = 0;
     int mSignal = 0; // that ends the process
     bool mDone = false;
+    std::function<std::string()> mLastWords;
     std::thread mThread;
 };
 

@@ -1,5 +1,7 @@
 #include "apps/moka/Progress.h"
 
+#include "apps/moka/Failure.h"
+
 #include <cmath>
 #include <cstdio>
 #include <unistd.h>
@@ -25,11 +27,12 @@ std::string DescribeCount(int done, int total, double seconds) {
 
 } // namespace
 
-Progress::Progress(bool enabled) {
-    if (enabled && isatty(STDERR_FILENO)) mThread = std::thread([this] { Draw(); });
+Progress::Progress(Kind kind) : mKind(kind) {
+    if (kind == Line && isatty(STDERR_FILENO)) mThread = std::thread([this] { Draw(); });
 }
 
 Progress::~Progress() {
+    if (mTotalCount == 0) TellStage();
     if (!mThread.joinable()) return;
     {
         std::lock_guard const lock(mMutex);
@@ -39,12 +42,30 @@ Progress::~Progress() {
     mThread.join();
 }
 
+void Progress::SetStage(char const* stage) {
+    TellStage();
+    mStage = stage;
+    mStageStart = Clock::now();
+}
+
+void Progress::Tell(std::string const& what) const {
+    if (mKind == Verbose) PrintError(what);
+}
+
+void Progress::TellStage() {
+    if (mKind != Verbose) return;
+    char text[80];
+    std::chrono::duration<double> const elapsed = Clock::now() - mStageStart;
+    std::snprintf(text, sizeof(text), "%s took %.3f s", mStage.load(), elapsed.count());
+    Tell(text);
+}
+
 void Progress::EraseLine() {
     if (isatty(STDERR_FILENO)) std::fputs("\r\033[K", stderr);
 }
 
 std::string Progress::Describe() const {
-    std::chrono::duration<double> const elapsed = std::chrono::steady_clock::now() - mStart;
+    std::chrono::duration<double> const elapsed = Clock::now() - mStart;
     if (mTotalCount > 0) return DescribeCount(mDoneCount, mTotalCount, elapsed.count());
     char text[80];
     std::snprintf(text, sizeof(text), "%s, %.1f s", mStage.load(), elapsed.count());

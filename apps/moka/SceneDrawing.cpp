@@ -5,10 +5,13 @@
 #include "apps/moka/Interruption.h"
 #include "apps/moka/LogCollector.h"
 #include "apps/moka/PenStroke.h"
+#include "apps/moka/StandardStreams.h"
 #include "moka/base/Bitmap.h"
 #include "moka/base/BitmapFactory.h"
 #include "moka/base/String.h"
 #include "scenes/SceneError.h"
+
+#include <string>
 
 namespace Moka::Tool {
 
@@ -37,16 +40,18 @@ Scenes::Picture DrawOnGpu(Scenes::Scene const& scene, RenderThread& queue, LogCo
     }
 }
 
-void SavePicture(Scenes::Picture const& picture, std::string const& path, Interruption& interruption) {
+void SavePicture(Scenes::Picture const& picture, OutputFile& output, Interruption& interruption) {
     Bitmap image;
     // Only read; the bitmap has no constant form.
     image.Construct(const_cast<unsigned char*>(picture.pixels.data()), picture.width, picture.height,
                     static_cast<int>(picture.GetStride()), Bitmap::kFormatRgba8888, false, false);
-    String const name(path);
+    std::string const path = output.GetPath();
+    String const name = String::FromFileName(path);
     Interruption::Saving const saving(interruption);
     std::string reason;
     if (!BitmapFactory::SaveBitmap(&image, &name, GetUsualQuality(path), &reason))
         throw Failure(TellCannot("save", path, reason));
+    output.Take();
 }
 
 } // namespace Moka::Tool

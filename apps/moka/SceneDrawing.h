@@ -6,12 +6,12 @@
 #include "scenes/SceneRenderer.h"
 
 #include <memory>
-#include <string>
 
 namespace Moka::Tool {
 
 class Interruption;
 class LogCollector;
+class OutputFile;
 
 // Clears the log.
 std::unique_ptr<RenderThread> StartForScene(RenderThreadOptions const& options, LogCollector& log);
@@ -19,6 +19,6 @@ std::unique_ptr<RenderThread> StartForScene(RenderThreadOptions const& options, 
 Scenes::Picture DrawOnGpu(Scenes::Scene const& scene, RenderThread& queue, LogCollector const& log);
 
 // In the format of the extension: JPEG at quality 90, the others with every pixel.
-void SavePicture(Scenes::Picture const& picture, std::string const& path, Interruption& interruption);
+void SavePicture(Scenes::Picture const& picture, OutputFile& output, Interruption& interruption);
 
 } // namespace Moka::Tool

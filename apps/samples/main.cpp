@@ -1,23 +1,31 @@
-// moka_samples: paints the pictures of the demonstration, and compares image files pixel by pixel.
+// moka_samples: draws the demonstration's note page, and compares image files pixel by pixel.
+#include "apps/moka/PenStroke.h"
 #include "apps/samples/Compare.h"
-#include "apps/samples/Pictures.h"
+#include "apps/samples/Note.h"
+#include "moka/base/Bitmap.h"
+#include "moka/base/BitmapFactory.h"
+#include "moka/base/String.h"
+#include "moka/base/System.h"
+#include "moka/host/RenderThread.h"
+#include "scenes/SceneError.h"
+#include "scenes/SceneRenderer.h"
 
 #include <cstdio>
 #include <cstring>
+#include <memory>
 #include <string>
 
 namespace {
 
-constexpr int kPhotoQuality = 92;
-constexpr int kLossless = 100;
+using namespace Moka;
 
 int Usage() {
-    std::fputs("moka_samples: give FOLDER, to paint the pictures there, or --compare A B\n", stderr);
+    std::fputs("moka_samples: give --note PAGE.json OUTPUT, or --compare A B\n", stderr);
     return 2;
 }
 
 int CompareFiles(char const* a, char const* b) {
-    Moka::Samples::Comparison const result = Moka::Samples::Compare(a, b);
+    Samples::Comparison const result = Samples::Compare(a, b);
     if (!result.isRead) return 1;
     if (!result.isSameSize) {
         std::printf("%s and %s: different sizes\n", a, b);
@@ -30,17 +38,30 @@ int CompareFiles(char const* a, char const* b) {
     return 1;
 }
 
-int PaintAll(std::string const& folder) {
-    bool const isDone = Moka::Samples::PaintPhoto().Save(folder + "/photo.jpg", kPhotoQuality) &&
-                        Moka::Samples::PaintNote().Save(folder + "/note.png", kLossless) &&
-                        Moka::Samples::PaintSticker().Save(folder + "/sticker.webp", kLossless) &&
-                        Moka::Samples::PaintScroll().Save(folder + "/scroll.png", kLossless);
-    return isDone ? 0 : 1;
+int DrawNote(std::string const& page, std::string const& output) {
+    std::string error;
+    std::unique_ptr<RenderThread> const queue = RenderThread::Start({}, &error);
+    if (!queue) throw Scenes::SceneError(error);
+    Tool::PenStroke pen(*queue);
+    Scenes::Picture picture = RenderScene(Samples::MakeNote(page), *queue, &pen);
+    Bitmap image;
+    image.Construct(picture.pixels.data(), picture.width, picture.height,
+                    static_cast<int>(picture.GetStride()), Bitmap::kFormatRgba8888, false, false);
+    String const name = String::FromFileName(output);
+    return BitmapFactory::SaveBitmap(&image, &name, 100) ? 0 : 1;
 }
 
 } // namespace
 
 int main(int argc, char** argv) {
-    if (argc == 4 && std::strcmp(argv[1], "--compare") == 0) return CompareFiles(argv[2], argv[3]);
-    return argc == 2 && argv[1][0] != '-' ? PaintAll(argv[1]) : Usage();
+    if (argc != 4) return Usage();
+    Moka::System::SetBuildTypeEngMode(true); // what the log says names the files
+    try {
+        if (std::strcmp(argv[1], "--compare") == 0) return CompareFiles(argv[2], argv[3]);
+        if (std::strcmp(argv[1], "--note") == 0) return DrawNote(argv[2], argv[3]);
+    } catch (std::exception const& error) {
+        std::fprintf(stderr, "moka_samples: %s\n", error.what());
+        return 1;
+    }
+    return Usage();
 }

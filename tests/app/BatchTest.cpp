@@ -86,7 +86,7 @@ TEST_F(BatchTest, ABrokenFileStopsNoOtherAndIsNamedInItsTurnWithItsReason) {
     for (std::string const& name : good) ExpectSamePixels(MakeInkPage(40, 30), "out/" + name);
 }
 
-TEST_F(BatchTest, NamesMayHoldSpacesAndAnyAlphabet) {
+TEST_F(BatchTest, NamesMayHoldAnyBytes) {
     Save(MakeGradient(8, 8), "в саду ☕ 1.png");
     Save(MakeGradient(9, 8), "été.old.JPG.png");
     Save(MakeGradient(10, 8), "two\nlines.png");
@@ -96,6 +96,25 @@ TEST_F(BatchTest, NamesMayHoldSpacesAndAnyAlphabet) {
     ExpectSamePixels(Load("в саду ☕ 1.png"), "mes dossiers/в саду ☕ 1.mki");
     ExpectSamePixels(Load("été.old.JPG.png"), "mes dossiers/été.old.JPG.mki");
     ExpectSamePixels(Load("two\nlines.png"), "mes dossiers/two\nlines.mki");
+    // Not UTF-8.
+    Save(MakeGradient(11, 8), "plain.png");
+    std::filesystem::rename(Path("plain.png"), Path("caf\xE9.png"));
+    RunWell({"convert", "caf\xE9.png", "--to", "mki", "--out", "\xFF"});
+    ExpectSamePixels(MakeGradient(11, 8), "\xFF/caf\xE9.mki");
+    EXPECT_THAT(RunWell({"convert", "caf\xE9.png", "\xE9.webp"}),
+                StartsWith("caf\xEF\xBF\xBD.png (PNG 11x8)"));
+    ExpectSamePixels(MakeGradient(11, 8), "\xE9.webp");
+}
+
+// The rate is that of the converted files: without any it is 0, and no folder stays.
+TEST_F(BatchTest, TheFolderIsMadeForWhatComesIntoIt) {
+    Save(MakeAlphaPattern(40, 30), "a.png");
+    WriteFile("bad.png", "no image");
+    RunWell({"convert", "a.png", "--to", "mki", "--out", "new/pages"});
+    ExpectSamePixels(MakeAlphaPattern(40, 30), "new/pages/a.mki");
+    ProcessResult const result = Run({"convert", "bad.png", "--to", "mki", "--out", "none"});
+    EXPECT_EQ(result.out, "0 of 1 image -> none/ (mki), 0.0 files/s\n");
+    EXPECT_THAT(List(), ElementsAre("a.png", "bad.png", "new", "out"));
 }
 
 TEST_F(BatchTest, FilesAreReplacedEvenTheInputs) {
@@ -115,22 +134,23 @@ TEST_F(BatchTest, WrongUsageIsToldBeforeAnyWork) {
     Save(MakeGradient(8, 8), "more/a.jpg");
     ExpectFails({"convert", "--to", "mki", "--out", "out"}, kUsage, {"INPUT"});
     ExpectFails({"convert", "a.png", "--to", "mki"}, kUsage, {"--to", "--out"});
+    ExpectFails(Batch({"a.png", "-"}, "mki"), kUsage, {"standard input", "OUTPUT"});
     ExpectFails({"convert", "a.png", "b.png", "--out", "out"}, kUsage, {"--out", "--to"});
-    ExpectFails({"convert", "a.png", "b.png", "--jobs", "2"}, kUsage, {"--jobs", "--to"});
+    ExpectFails({"convert", "a.png", "b.png", "--jobs", "2"}, kUsage, {"--jobs", "--out"});
     for (std::string const jobs : {"0", "65", "many"})
         ExpectFails(Batch({"a.png"}, "mki", {"--jobs", jobs}), kUsage, {"--jobs", jobs});
     for (std::string const format : {"bmp", "PNG", "", "x.png", "../a.png"})
         ExpectFails(Batch({"a.png"}, format), kUsage, {"--to", "'" + format + "'", "webp"});
-    ExpectFails({"convert", "a.png", "--to", "mki", "--out", "nowhere"}, kUsage, {"nowhere", "create it"});
-    ExpectFails({"convert", "a.png", "--to", "mki", "--out", "a.png"}, kUsage, {"no folder a.png"});
+    ExpectFails({"convert", "a.png", "--to", "mki", "--out", "a.png"}, kFailed, {"make the folder a.png"});
+    ExpectFails({"convert", "a.png", "--to", "mki", "--out", "a.png/b"}, kFailed, {"folder a.png/b"});
+    ExpectFails({"convert", "a.png", "--to", "mki", "--out", "new"}, kFailed, {"Install"}, WithoutDriver());
     ExpectFails({"convert", "a.png", "--to", "mki", "--out", ""}, kUsage, {"--out", "empty"});
     ExpectFails(Batch({"a.png", ""}, "mki"), kUsage, {"empty"});
-    ExpectFails(Batch({"a.png", "b\xFF.png"}, "mki"), kUsage, {"UTF-8"});
     ExpectFails(Batch({"a.png", "more/a.jpg"}, "mki"), kUsage, {"a.png", "more/a.jpg", "out/a.mki"});
     ExpectFails(Batch({"a.png", "./a.png"}, "mki"), kUsage, {"out/a.mki"});
     // What concerns all is told once.
     ExpectFails(Batch({"a.png", "more/b.png"}, "mki", {"--max-texture", "64", "--size", "65x9"}), kFailed,
-                {"--size asks for 65 pixels", "up to 64"});
+                {"--size asks for 65 pixels", "--max-texture 64"});
 }
 
 } // namespace

@@ -36,6 +36,29 @@ TEST_F(ConvertTest, QualityReachesTheEncoder) {
     }
 }
 
+TEST_F(ConvertTest, ADashIsStandardInputAndOutput) {
+    TestImage const image = MakeAlphaPattern(61, 47);
+    Save(image, "in.webp");
+    ProcessOptions options;
+    options.in = Path("in.webp");
+    ProcessResult const piped = Run({"convert", "-", "-"}, options);
+    EXPECT_EQ(piped.status, 0) << piped.err;
+    WriteFile("out.png", piped.out);
+    EXPECT_EQ(piped.out.substr(1, 3), "PNG");
+    ExpectSamePixels(image, "out.png");
+    EXPECT_EQ(Run({"convert", "-", "-", "--to", "mki"}, options).out.substr(0, 4), "MKI1");
+    EXPECT_THAT(Run({"convert", "-", "out.mki"}, options).out, HasSubstr("standard input (WebP 61x47) -> "));
+    ExpectSamePixels(image, "out.mki");
+    EXPECT_THAT(Run({"info", "-"}, options).out, HasSubstr("standard input: WebP, 61x47, alpha, "));
+    WriteFile("scene.json", R"({"size": [7, 5], "background": "#102030", "operations": []})");
+    options.in = Path("scene.json");
+    WriteFile("drawn.webp", Run({"draw", "-", "-o", "-", "--to", "webp"}, options).out);
+    EXPECT_EQ(Load("drawn.webp").width, 7);
+    // Where nobody can write, nothing is left either.
+    options.out = "/dev/full";
+    ExpectFails({"convert", "in.webp", "-"}, kFailed, {"standard output", "No space"}, options);
+}
+
 TEST_F(ConvertTest, TellsWhatItDidUnlessQuiet) {
     Save(MakeGradient(30, 20), "in.png");
     std::string const told = RunWell({"convert", "in.png", "out.mki"});

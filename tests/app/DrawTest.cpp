@@ -1,7 +1,10 @@
 #include "tests/app/ToolTest.h"
 
+#include <chrono>
+#include <csignal>
 #include <fstream>
 #include <iterator>
+#include <thread>
 
 namespace Moka::Testing {
 namespace {
@@ -68,7 +71,7 @@ TEST_F(DrawTest, DrawsTheExamplesOfTheDocuments) {
     EXPECT_NE(petals.GetColor(250, 120), petals.GetColor(160, 120));
 }
 
-TEST_F(DrawTest, AMistakeIsNamedWithFileAndLineAndNothingIsWritten) {
+TEST_F(DrawTest, AMistakeIsNamedWithItsPlaceAndNothingIsWritten) {
     Save(MakeGradient(4, 4), "old.png");
     WriteFile("bad.json", "{\"size\": [30, 20],\n\"operations\": [\n{\"DrawCircle\": {\"cx\": \"x\"}}]}");
     WriteFile("broken.json", "{\"size\": [30, 20],\n\"operations\": [");
@@ -76,10 +79,10 @@ TEST_F(DrawTest, AMistakeIsNamedWithFileAndLineAndNothingIsWritten) {
               "{\"size\": [30, 20], \"operations\": [],\n\"bitmaps\": {\"a\": {\"file\": \"no.png\"}}}");
     WriteFile("good.json", "{\"size\": [30, 20], \"operations\": []}");
     ExpectFails({"draw", "bad.json", "-o", "old.png"}, kFailed,
-                {"bad.json:3: DrawCircle: cx must be a number"});
-    ExpectFails({"draw", "broken.json", "-o", "new.png"}, kFailed, {"broken.json:2: ", "end of input"});
+                {"bad.json:3:23: operations[0].DrawCircle.cx must be a number"});
+    ExpectFails({"draw", "broken.json", "-o", "new.png"}, kFailed, {"broken.json:2:15: ", "end of input"});
     ExpectFails({"draw", "image.json", "-o", "new.png"}, kFailed,
-                {"image.json:2: ", "no.png", "No such file"});
+                {"image.json:2:27: bitmaps.a.file", "no.png", "No such file"});
     ExpectFails({"draw", "missing.json", "-o", "new.png"}, kFailed, {"missing.json", "No such file"});
     ExpectFails({"draw", ".", "-o", "new.png"}, kFailed, {"is a folder"});
     ExpectFails({"draw", "/dev/zero", "-o", "new.png"}, kFailed, {"/dev/zero is larger than 16 MiB"});
@@ -87,6 +90,34 @@ TEST_F(DrawTest, AMistakeIsNamedWithFileAndLineAndNothingIsWritten) {
     ExpectFails({"draw", "good.json", "-o", "nowhere/new.png"}, kFailed, {"nowhere", "create it first"});
     ExpectFails({"draw", "good.json"}, kUsage, {"-o", "moka draw --help"});
     ExpectFails({"draw", "-o", "new.png"}, kUsage, {"SCENE", "moka draw --help"});
+}
+
+// A mistake leaves the picture as it was; the next good version replaces it.
+TEST_F(DrawTest, WatchingDrawsAgainWhenTheFileChanges) {
+    auto const write = [this](std::string const& size) {
+        WriteFile("next.json", "{\"size\": [" + size + "], \"operations\": []}");
+        std::filesystem::rename(Path("next.json"), Path("s.json"));
+    };
+    auto const waitForWidth = [this](int width) {
+        for (int i = 0; i < 1000 && Load("out.png").width != width; ++i)
+            std::this_thread::sleep_for(std::chrono::milliseconds(10));
+        return Load("out.png").width;
+    };
+    ExpectFails({"draw", "--watch", "s.json", "-o", "out.png"}, kFailed, {"s.json", "No such file"});
+    write("4, 3");
+    Save(MakeGradient(2, 2), "out.png");
+    MokaProcess process(mFolder.string(), {"draw", "--watch", "s.json", "-o", "out.png"});
+    EXPECT_EQ(waitForWidth(4), 4);
+    write("\"wide\", 3");
+    std::this_thread::sleep_for(std::chrono::milliseconds(600));
+    EXPECT_EQ(Load("out.png").width, 4);
+    write("5, 3");
+    EXPECT_EQ(waitForWidth(5), 5);
+    process.Signal(SIGINT);
+    ProcessResult const result = process.Wait();
+    EXPECT_EQ(result.signal, SIGINT);
+    EXPECT_EQ(result.err, "moka: s.json:1:11: size[0] must be a number, not \"wide\"\n");
+    EXPECT_THAT(List(), ElementsAre("out.png", "s.json"));
 }
 
 } // namespace

@@ -6,6 +6,7 @@
 namespace Moka::Testing {
 namespace {
 
+using ::testing::ContainsRegex;
 using ::testing::HasSubstr;
 
 class FailureTest : public ToolTest {
@@ -27,7 +28,10 @@ TEST_F(FailureTest, WrongUsage) {
     ExpectFails({"convert", "in.png", "out.mki", "third"}, kUsage, {"third"});
     ExpectFails({"convert", "in.png", "out.mki", "--qualify", "3"}, kUsage, {"--qualify"});
     ExpectFails({"convert", "", "out.mki"}, kUsage, {"empty"});
-    ExpectFails({"convert", "in\xFF.png", "out.mki"}, kUsage, {"UTF-8"});
+    ExpectFails({"convert", "in.png", "out.mki", "--to", "webp"}, kUsage, {"--to needs --out"});
+    ExpectFails({"draw", "in.json", "-o", "out.png", "--to", "png"}, kUsage, {"out.png", "extension"});
+    ExpectFails({"draw", "--watch", "-", "-o", "out.png"}, kUsage, {"--watch"});
+    ExpectFails({"draw", "--watch", "in.json", "-o", "-"}, kUsage, {"--watch"});
 }
 
 TEST_F(FailureTest, BadNumbers) {
@@ -56,6 +60,12 @@ TEST_F(FailureTest, InputsThatAreNoImage) {
     ExpectFails({"convert", "folder.png", "old.png"}, kFailed, {"folder.png", "folder"});
     ExpectFails({"convert", "/dev/zero", "old.png"}, kFailed, {"/dev/zero", "regular file"});
     ExpectFails({"convert", "two\nlines.png", "old.png"}, kFailed, {"lines.png"});
+    ExpectFails({"convert", "in\xFF.png", "old.png"}, kFailed, {"in\xEF\xBF\xBD.png", "No such file"});
+    ProcessOptions options;
+    options.in = Path("text.png");
+    ExpectFails({"convert", "-", "old.png"}, kFailed, {"standard input", "PNG, JPEG, WebP"}, options);
+    ExpectFails({"info", "-"}, kFailed, {"standard input", "PNG, JPEG, WebP"}, options);
+    ExpectFails({"draw", "-", "-o", "old.png"}, kFailed, {"standard input:1:"}, options);
     for (std::string const name : {"cut.png", "cut.jpg", "cut.webp", "cut.mki"}) {
         Save(MakeInkPage(90, 70), name);
         Truncate(name);
@@ -98,19 +108,24 @@ TEST_F(FailureTest, NoDriver) {
 }
 
 TEST_F(FailureTest, WiderThanATexture) {
-    ExpectFails({"convert", "in.png", "old.png", "--max-texture", "64"}, kFailed,
-                {"in.png is 90 pixels wide", "up to 64", "--size 64x49"});
+    ExpectFails(
+        {"convert", "in.png", "old.png", "--max-texture", "64"}, kFailed,
+        {"in.png is 90 pixels wide", "--max-texture 64 limits the width", "at least 90", "--size 64x49"});
     ExpectFails({"convert", "in.png", "old.png", "--max-texture", "64", "--size", "65x9"}, kFailed,
-                {"--size asks for 65 pixels", "up to 64"});
+                {"--size asks for 65 pixels", "--max-texture 64"});
     RunWell({"convert", "in.png", "out.png", "--max-texture", "64", "--size", "64x49"});
 }
 
-TEST_F(FailureTest, VerboseShowsTheLibrarysLog) {
+TEST_F(FailureTest, VerboseTellsWhatHappensWithTheLibrarysLog) {
     ProcessResult const result =
         Run({"convert", "missing.png", "in.png", "--to", "mki", "--out", ".", "--verbose"});
     EXPECT_EQ(result.status, kFailed);
-    for (char const* part : {"error: cannot read image 'missing.png'", "moka: cannot read", "info: "})
+    for (char const* part : {"error: cannot read image 'missing.png'", "moka: cannot read",
+                             "info: ", "moka: in.png -> ./in.mki\n", ", EGL "})
         EXPECT_THAT(result.err, HasSubstr(part));
+    ProcessResult const single = Run({"convert", "in.png", "one.mki", "-v"});
+    for (char const* stage : {"decode", "upload", "read back", "encode"})
+        EXPECT_THAT(single.err, ContainsRegex("moka: " + std::string(stage) + " took [0-9.]+ s\n"));
 }
 
 TEST_F(FailureTest, OutputThatIsLost) {

@@ -17,13 +17,27 @@ TEST_F(InfoTest, TellsWhatEachFileIsWithoutADriverAndABrokenOneHidesNoOther) {
     auto const size = [this](char const* name) { return std::to_string(ReadFile(name).size()); };
     ProcessResult const result = Run(
         {"info", "bad.png", "a.png", "b.png", "c d.jpg", "missing.png", "e.webp", "f.mki"}, WithoutDriver());
-    EXPECT_EQ(result.out, "a.png: PNG, 30x20, alpha, " + size("a.png") + " bytes, 2400 decoded\n" +
-                              "b.png: PNG, 30x20, opaque, " + size("b.png") + " bytes, 2400 decoded\n" +
+    EXPECT_EQ(result.out, "a.png: PNG, 30x20, alpha, " + size("a.png") +
+                              " bytes, 2400 decoded, profile sRGB\n" + "b.png: PNG, 30x20, opaque, " +
+                              size("b.png") + " bytes, 2400 decoded, profile sRGB\n" +
                               "c d.jpg: JPEG, 31x20, opaque, " + size("c d.jpg") + " bytes, 2480 decoded\n" +
                               "e.webp: WebP, 32x20, alpha, " + size("e.webp") + " bytes, 2560 decoded\n" +
                               "f.mki: mki, 33x20, alpha, " + size("f.mki") + " bytes, 2640 decoded\n");
     EXPECT_EQ(result.status, kFailed);
     EXPECT_THAT(result.err, MatchesRegex("moka: [^\n]*bad\\.png[^\n]*\nmoka: [^\n]*missing\\.png[^\n]*\n"));
+}
+
+// An animation of two frames, whose chunk stands before the pixels, and a name that would clear a terminal.
+TEST_F(InfoTest, TellsFramesAndShowsNoControlCharacter) {
+    Save(MakeGradient(30, 20), "a.png");
+    std::string const control{'\0', '\0', '\0', 8, 'a', 'c', 'T', 'L', 0, 0, 0, 2, 0, 0, 0, 0};
+    std::string const checksum{'\xF3', '\x8D', '\x93', '\x70'};
+    std::string const name = "a\x1B[2J\xC2\x9B\xFF.png";
+    WriteFile(name, ReadFile("a.png").insert(33, control + checksum));
+    EXPECT_THAT(
+        Run({"info", name}).out,
+        MatchesRegex("a\\?\\[2J\\?\xEF\xBF\xBD\\.png: PNG, 30x20, opaque, [0-9]+ bytes, 2400 decoded, "
+                     "profile sRGB, 2 frames \\(one is read\\)\n"));
 }
 
 TEST_F(InfoTest, TellsTheDeviceWithoutAFile) {

@@ -52,6 +52,7 @@ void MokaProcess::RunChild(std::vector<std::string> const& arguments, ProcessOpt
     for (std::string const& variable : options.environment) putenv(const_cast<char*>(variable.c_str()));
     int const out = options.out.empty() ? mOut : open(options.out.c_str(), O_WRONLY);
     dup2(out, STDOUT_FILENO);
+    if (!options.in.empty()) dup2(open(options.in.c_str(), O_RDONLY), STDIN_FILENO);
     dup2(options.terminal >= 0 ? options.terminal : mErr, STDERR_FILENO);
     if (chdir(mFolder.c_str()) != 0) _exit(126);
     if (options.fileSizeLimit > 0) {

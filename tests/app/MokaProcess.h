@@ -21,6 +21,7 @@ struct ProcessOptions {
     long fileSizeLimit = 0;               // bytes; 0 for none
     int terminal = -1;                    // a terminal to use as stderr; err then stays empty
     std::string out;                      // a file to use as stdout
+    std::string in;                       // a file to use as stdin
 };
 
 // A running tool. Ended, if it still runs, with this object.

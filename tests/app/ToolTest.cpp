@@ -37,7 +37,7 @@ void ToolTest::Truncate(std::string const& name) const {
 }
 
 TestImage ToolTest::Load(std::string const& name) const {
-    String const path(Path(name));
+    String const path = String::FromFileName(Path(name));
     std::unique_ptr<Bitmap> const bitmap(BitmapFactory::CreateBitmapForGraphics(&path));
     if (!bitmap) return {0, 0};
     TestImage image(bitmap->GetWidth(), bitmap->GetHeight());

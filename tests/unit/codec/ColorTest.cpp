@@ -1,4 +1,6 @@
 // What files say of their colours. Expected values come from the formulas of sRGB, Display P3 and CIE Lab.
+#include "moka/base/Bitmap.h"
+#include "moka/base/String.h"
 #include "moka/base/log/AndroidLog.h"
 #include "tests/support/ColorProfiles.h"
 #include "tests/support/LogCapture.h"
@@ -10,6 +12,7 @@
 #include <functional>
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
+#include <memory>
 #include <turbojpeg.h>
 
 namespace Moka::Testing {
@@ -216,7 +219,7 @@ TEST(Color, AProfileThatCannotBeUsedIsIgnoredWithOneWarning) {
             LogCapture const log;
             EXPECT_EQ(Decode(EmbedProfile(plain, profile), "some/folder/odd.img"), expected);
             EXPECT_THAT(log.GetTexts(ANDROID_LOG_WARN),
-                        ElementsAre(HasSubstr("'odd.img': its colour profile is ignored: ")));
+                        ElementsAre(HasSubstr("'****/******/***.img': its colour profile is ignored: ")));
             EXPECT_EQ(log.GetTexts().size(), 1u);
         }
     }
@@ -227,6 +230,17 @@ TEST(Color, AProfileThatCannotBeUsedIsIgnoredWithOneWarning) {
     LogCapture const log;
     EXPECT_EQ(Decode(parts), Decode(jpeg));
     EXPECT_EQ(log.Count(ANDROID_LOG_WARN), 1);
+    // It is no reason for a failure.
+    TempFolder const folder;
+    String const path(folder.Path("odd.jpg"));
+    WriteFile(folder.Path("odd.jpg"), parts);
+    std::string reason;
+    ImageInfo info;
+    EXPECT_TRUE(BitmapFactory::GetImageInfo(&path, &info, &reason));
+    EXPECT_TRUE(std::unique_ptr<Bitmap>(BitmapFactory::CreateBitmapForGraphics(&path, &reason)));
+    EXPECT_TRUE(std::unique_ptr<Bitmap>(BitmapFactory::CreateBitmap(&path, 4, 4, &reason)));
+    EXPECT_EQ(reason, "");
+    EXPECT_EQ(log.GetTexts().size(), 3u);
 }
 
 // Bytes of a profile that are wrong anywhere: some image comes, and nothing is kept or overrun.

@@ -136,10 +136,10 @@ TEST(SceneFormat, GroupsArePlacedClippedRepeatedAndLeaveNothingBehind) {
 
 TEST(SceneFormat, SizeAndBackgroundAreTheScenes) {
     Scene const scene = ParseScene(
-        R"({"about": "A & B.", "size": [16384, 1], "background": [0.5, 0.25, 0, 0.5], "operations": []})",
+        R"({"about": "A & B.", "size": [65535, 1], "background": [0.5, 0.25, 0, 0.5], "operations": []})",
         "x", "");
     EXPECT_EQ(scene.about, "A & B.");
-    EXPECT_EQ(scene.width, 16384);
+    EXPECT_EQ(scene.width, 65535);
     EXPECT_EQ(scene.height, 1);
     EXPECT_EQ(scene.background.x, 0.5f);
     EXPECT_EQ(scene.background.w, 0.5f);
@@ -168,8 +168,9 @@ TEST(SceneFormat, AMistakeInTheFileIsNamedWithItsPlace) {
         {"{\"size\": [8, 6],\n  \"size\": [8, 6]}", "2:3: \"size\" is given twice"},
         {"{\n}", "1:1: the scene needs \"size\""},
         {"{\"size\": 8}", "1:10: size must be [width, height], not 8"},
-        {"{\"size\": [8,\n0]}", "2:1: size[1] must be a whole number from 1 to 16384, not 0"},
-        {"{\"size\": [16385, 1]}", "1:11: size[0] must be a whole number from 1 to 16384, not 16385"},
+        {"{\"size\": [8,\n0]}", "2:1: size[1] must be a whole number from 1 to 65535, not 0"},
+        {"{\"size\": [65536, 1]}", "1:11: size[0] must be a whole number from 1 to 65535, not 65536"},
+        {"{\"size\": [16384, 16385]}", "1:10: size: more than 1 GiB of pixels"},
         {"{\"size\": [8, 6], \"operations\": {}}", "1:32: operations must be a list of operations"},
         {"{\"size\": [8, 6], \"operations\": [],\n\"backgroud\": 1}",
          "2:14: backgroud is unknown; there are size, about, background, bitmaps, paints, operations"},
