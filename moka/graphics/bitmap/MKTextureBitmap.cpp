@@ -1,7 +1,7 @@
 #include "moka/graphics/bitmap/MKTextureBitmap.h"
 
 #include "moka/base/RefPtr.h"
-#include "moka/graphics/bitmap/MKGraphicsFactory.h"
+#include "moka/graphics/bitmap/BitmapCreation.h"
 #include "moka/graphics/bitmap/MKSubBitmap.h"
 #include "moka/graphics/bitmap/MKSubBitmapRT.h"
 #include "moka/graphics/task/WorkerTask.h"
@@ -150,7 +150,7 @@ void MKTextureBitmap::SetTag(char const* tag) {
 }
 
 IMKBitmap* MKTextureBitmap::Clone() {
-    IMKBitmap* const clone = MKGraphicsFactory::CreateBitmap(mMsgQueue, this, 1);
+    IMKBitmap* const clone = detail::CreateSharedBitmap(mMsgQueue, this, 1);
     if (clone) clone->SetTag(GetTag());
     return clone;
 }
