@@ -34,22 +34,18 @@ bool MKCanvasImplBase::FrameBuffers::Next() {
     if (!mStrips) {
         writable = mIsDone ? nullptr : mTarget->GetBitmapWritable();
         mIsDone = true;
-        if (!Exists()) return false;
+        if (!writable || (mAttachable && !mAttachable->HasFrameBufferRT(-1))) return false;
         bounds = RectF(mTarget->GetBitmapRect());
         return true;
     }
     while (++index < mStrips->GetSubBitmapCount()) {
         IMKSubBitmap* const strip = mStrips->GetSubBitmap(index);
+        if (!strip || (mAttachable && !mAttachable->HasFrameBufferRT(index))) continue;
         writable = strip;
-        if (!Exists()) continue;
         bounds = RectF(strip->GetBitmapRect());
         return true;
     }
     return false;
-}
-
-bool MKCanvasImplBase::FrameBuffers::Exists() const {
-    return writable && (!mAttachable || mAttachable->HasFrameBufferRT(index));
 }
 
 MKCanvasImplBase::Drawing::Drawing(MKCanvasClipping* clipping, IMKBitmapWritable* writable, int index)

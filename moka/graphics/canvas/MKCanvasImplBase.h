@@ -47,8 +47,6 @@ protected:
         int index = -1; // the strip, or -1 for a target that is one frame buffer
 
     private:
-        bool Exists() const;
-
         IMKBitmap* const mTarget;
         IMKTextureBitmap* const mStrips; // null for a target that is one frame buffer
         IMKBitmapCanvasAttachable* const mAttachable;
