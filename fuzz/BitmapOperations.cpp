@@ -2,7 +2,7 @@
 #include "moka/graphics/bitmap/IMKBitmapReadable.h"
 #include "moka/graphics/bitmap/IMKSubBitmap.h"
 #include "moka/graphics/bitmap/IMKTextureBitmap.h"
-#include "moka/graphics/bitmap/MKGraphicsFactory.h"
+#include "moka/graphics/factory/MKGraphicsFactory.h"
 
 #include <algorithm>
 #include <string>

@@ -1,7 +1,7 @@
 #include "fuzz/CanvasWorld.h"
 #include "moka/graphics/bitmap/IMKBitmapWritable.h"
 #include "moka/graphics/bitmap/IMKTextureBitmap.h"
-#include "moka/graphics/bitmap/MKGraphicsFactory.h"
+#include "moka/graphics/factory/MKGraphicsFactory.h"
 
 #include <string>
 

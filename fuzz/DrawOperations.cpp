@@ -1,9 +1,9 @@
 #include "fuzz/CanvasWorld.h"
-#include "moka/graphics/canvas/MKPaint.h"
 #include "moka/graphics/drawable/MKBlendedBitmapDrawable.h"
 #include "moka/graphics/drawable/MKGaussianBlurDrawable.h"
 #include "moka/graphics/drawable/MKNonPremultipliedColorDrawable.h"
 #include "moka/graphics/drawable/MKTextMaskBitmapDrawable.h"
+#include "moka/graphics/paint/MKPaint.h"
 
 namespace Moka::Fuzz {
 namespace {

@@ -2,7 +2,7 @@
 // text that is no scene is refused with a message of one line that begins with the file and a line of it.
 #include "fuzz/CanvasWorld.h"
 #include "moka/base/log/LogSink.h"
-#include "moka/graphics/bitmap/MKGraphicsFactory.h"
+#include "moka/graphics/factory/MKGraphicsFactory.h"
 #include "scenes/SceneError.h"
 #include "scenes/SceneFile.h"
 #include "scenes/SceneRenderer.h"

@@ -2,13 +2,13 @@
 
 #include "moka/base/RefPtr.h"
 #include "moka/graphics/bitmap/IMKBitmap.h"
-#include "moka/graphics/bitmap/MKGraphicsFactory.h"
 #include "moka/graphics/canvas/IMKCanvas.h"
-#include "moka/graphics/canvas/MKPaint.h"
 #include "moka/graphics/drawable/MKBlendedBitmapDrawable.h"
 #include "moka/graphics/drawable/MKGaussianBlurDrawable.h"
 #include "moka/graphics/drawable/MKNonPremultipliedColorDrawable.h"
 #include "moka/graphics/drawable/MKTextMaskBitmapDrawable.h"
+#include "moka/graphics/factory/MKGraphicsFactory.h"
+#include "moka/graphics/paint/MKPaint.h"
 #include "scenes/Picture.h"
 #include "scenes/SceneError.h"
 

@@ -1,10 +1,10 @@
 #include "scenes/PenScenes.h"
 
 #include "moka/base/RefPtr.h"
-#include "moka/graphics/bitmap/MKGraphicsFactory.h"
 #include "moka/graphics/canvas/IMKCanvas.h"
 #include "moka/graphics/canvas/IMKPenCanvas.h"
-#include "moka/graphics/canvas/MKPaint.h"
+#include "moka/graphics/factory/MKGraphicsFactory.h"
+#include "moka/graphics/paint/MKPaint.h"
 #include "scenes/SceneError.h"
 #include "scenes/ScenePen.h"
 

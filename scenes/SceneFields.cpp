@@ -1,6 +1,6 @@
 #include "scenes/SceneFields.h"
 
-#include "moka/graphics/canvas/MKPaint.h"
+#include "moka/graphics/paint/MKPaint.h"
 #include "scenes/SceneError.h"
 
 #include <algorithm>

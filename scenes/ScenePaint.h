@@ -1,7 +1,7 @@
 // ScenePaint.h: paints of a scene, under the names that MKPaint gives its properties.
 #pragma once
 
-#include "moka/graphics/canvas/MKPaint.h"
+#include "moka/graphics/paint/MKPaint.h"
 #include "scenes/SceneFields.h"
 
 #include <map>

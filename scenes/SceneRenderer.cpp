@@ -4,8 +4,8 @@
 #include "moka/graphics/bitmap/IMKBitmap.h"
 #include "moka/graphics/bitmap/IMKSubBitmap.h"
 #include "moka/graphics/bitmap/IMKTextureBitmap.h"
-#include "moka/graphics/bitmap/MKGraphicsFactory.h"
 #include "moka/graphics/canvas/IMKCanvas.h"
+#include "moka/graphics/factory/MKGraphicsFactory.h"
 #include "moka/graphics/task/IGLMsgQueue.h"
 #include "scenes/SceneError.h"
 

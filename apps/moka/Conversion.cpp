@@ -9,7 +9,7 @@
 #include "moka/base/String.h"
 #include "moka/graphics/bitmap/IMKBitmap.h"
 #include "moka/graphics/bitmap/IMKTextureBitmap.h"
-#include "moka/graphics/bitmap/MKGraphicsFactory.h"
+#include "moka/graphics/factory/MKGraphicsFactory.h"
 #include "moka/host/RenderThread.h"
 
 #include <memory>

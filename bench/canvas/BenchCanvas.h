@@ -4,9 +4,9 @@
 #include "bench/canvas/Frame.h"
 #include "moka/base/RefPtr.h"
 #include "moka/graphics/bitmap/IMKBitmap.h"
-#include "moka/graphics/bitmap/MKGraphicsFactory.h"
 #include "moka/graphics/canvas/IMKCanvas.h"
-#include "moka/graphics/canvas/MKPaint.h"
+#include "moka/graphics/factory/MKGraphicsFactory.h"
+#include "moka/graphics/paint/MKPaint.h"
 #include "moka/host/RenderThread.h"
 
 namespace Moka::Bench {

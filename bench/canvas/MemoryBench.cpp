@@ -3,9 +3,9 @@
 // Counters: heap_mb and rss_mb hold what was posted, bytes is the heap's for each request.
 #include "moka/base/RefPtr.h"
 #include "moka/graphics/bitmap/IMKBitmap.h"
-#include "moka/graphics/bitmap/MKGraphicsFactory.h"
 #include "moka/graphics/canvas/IMKCanvas.h"
-#include "moka/graphics/canvas/MKPaint.h"
+#include "moka/graphics/factory/MKGraphicsFactory.h"
+#include "moka/graphics/paint/MKPaint.h"
 #include "moka/host/TaskQueue.h"
 
 #include <benchmark/benchmark.h>

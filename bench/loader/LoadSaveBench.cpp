@@ -9,7 +9,7 @@
 #include "moka/base/log/LogSink.h"
 #include "moka/graphics/bitmap/IMKBitmap.h"
 #include "moka/graphics/bitmap/ImageDecoding.h"
-#include "moka/graphics/bitmap/MKGraphicsFactory.h"
+#include "moka/graphics/factory/MKGraphicsFactory.h"
 #include "moka/graphics/loader/MKBitmapLoader.h"
 #include "moka/graphics/loader/MKBitmapSaveManager.h"
 #include "moka/host/RenderThread.h"

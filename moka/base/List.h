@@ -23,7 +23,8 @@ public:
 
     // Null when index is outside 0 ... count - 1.
     T* GetAt(int index) const {
-        return Has(index) ? mItems[mTaken + static_cast<std::size_t>(index)] : nullptr;
+        std::size_t const at = mTaken + static_cast<std::size_t>(index);
+        return index >= 0 && at < mItems.size() ? mItems[at] : nullptr;
     }
 
     // False, with the list unchanged, when memory for the item cannot be had.
@@ -38,7 +39,7 @@ public:
 
     // Takes the item out and returns it; null when index is outside 0 ... count - 1.
     T* RemoveAt(int index) {
-        if (!Has(index)) return nullptr;
+        if (index < 0 || index >= GetCount()) return nullptr;
         auto const at = Begin() + index;
         T* const item = *at;
         Erase(at);
@@ -61,7 +62,6 @@ public:
 private:
     using Position = typename std::vector<T*>::iterator;
 
-    bool Has(int index) const { return index >= 0 && index < GetCount(); }
     Position Begin() { return mItems.begin() + static_cast<std::ptrdiff_t>(mTaken); }
 
     void Erase(Position at) {

@@ -1,42 +1,24 @@
 #include "moka/base/Rect.h"
 
+#include "moka/base/Saturate.h"
+
 #include <algorithm>
 #include <cmath>
 #include <cstdint>
-#include <limits>
 
 namespace Moka {
-namespace {
-
-constexpr int kMinInt = std::numeric_limits<int>::min();
-constexpr int kMaxInt = std::numeric_limits<int>::max();
-
-int SaturatedDifference(int a, int b) {
-    std::int64_t const difference = std::int64_t{a} - b;
-    return static_cast<int>(std::clamp<std::int64_t>(difference, kMinInt, kMaxInt));
-}
-
-int SaturatedInt(float whole) {
-    if (std::isnan(whole)) return 0;
-    // The greatest int has no float of its own; the next float up is the first that does not fit.
-    if (whole >= 2147483648.0f) return kMaxInt;
-    if (whole <= -2147483648.0f) return kMinInt;
-    return static_cast<int>(whole);
-}
-
-} // namespace
 
 Rect::Rect(RectF const& r)
-    : left(SaturatedInt(std::floor(r.left))),
-      top(SaturatedInt(std::floor(r.top))),
-      right(SaturatedInt(std::ceil(r.right))),
-      bottom(SaturatedInt(std::ceil(r.bottom))) {}
+    : left(Saturate(std::floor(r.left))),
+      top(Saturate(std::floor(r.top))),
+      right(Saturate(std::ceil(r.right))),
+      bottom(Saturate(std::ceil(r.bottom))) {}
 
 Rect& Rect::operator=(RectF const& r) { return *this = Rect(r); }
 
-int Rect::GetWidth() const { return SaturatedDifference(right, left); }
+int Rect::GetWidth() const { return Saturate(std::int64_t{right} - left); }
 
-int Rect::GetHeight() const { return SaturatedDifference(bottom, top); }
+int Rect::GetHeight() const { return Saturate(std::int64_t{bottom} - top); }
 
 bool Rect::IsEmpty() const { return right <= left || bottom <= top; }
 

@@ -1,8 +1,8 @@
 // Memory runs out at every place where it can, once and for good, in every scenario.
 #include "moka/base/RefPtr.h"
 #include "moka/graphics/bitmap/IMKBitmap.h"
-#include "moka/graphics/bitmap/MKGraphicsFactory.h"
 #include "moka/graphics/canvas/IMKCanvas.h"
+#include "moka/graphics/factory/MKGraphicsFactory.h"
 #include "moka/renderer/RendererFactory.h"
 #include "tests/support/RendererTrace.h"
 #include "tests/trust/Faults.h"

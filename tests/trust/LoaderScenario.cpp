@@ -2,7 +2,7 @@
 #include "moka/base/RefPtr.h"
 #include "moka/base/String.h"
 #include "moka/graphics/bitmap/IMKBitmap.h"
-#include "moka/graphics/bitmap/MKGraphicsFactory.h"
+#include "moka/graphics/factory/MKGraphicsFactory.h"
 #include "moka/graphics/loader/BitmapLoader.h"
 #include "moka/graphics/loader/MKBitmapLoader.h"
 #include "moka/graphics/loader/MKBitmapSaveManager.h"

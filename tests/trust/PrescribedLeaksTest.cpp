@@ -1,7 +1,7 @@
 // Leaks that callers rely on and that no other test shows.
 #include "moka/base/String.h"
 #include "moka/graphics/bitmap/ImageDecoding.h"
-#include "moka/graphics/bitmap/MKGraphicsFactory.h"
+#include "moka/graphics/factory/MKGraphicsFactory.h"
 #include "tests/support/LogCapture.h"
 #include "tests/support/TestFiles.h"
 #include "tests/trust/Faults.h"

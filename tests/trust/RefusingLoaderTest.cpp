@@ -4,7 +4,7 @@
 #include "moka/base/String.h"
 #include "moka/graphics/bitmap/IMKBitmap.h"
 #include "moka/graphics/bitmap/ImageDecoding.h"
-#include "moka/graphics/bitmap/MKGraphicsFactory.h"
+#include "moka/graphics/factory/MKGraphicsFactory.h"
 #include "moka/graphics/loader/BitmapLoader.h"
 #include "moka/graphics/loader/MKBitmapLoader.h"
 #include "moka/renderer/RendererFactory.h"

@@ -6,14 +6,14 @@
 #include "moka/base/String.h"
 #include "moka/graphics/bitmap/IMKSubBitmap.h"
 #include "moka/graphics/bitmap/IMKTextureBitmap.h"
-#include "moka/graphics/bitmap/MKGraphicsFactory.h"
 #include "moka/graphics/canvas/IMKCanvas.h"
 #include "moka/graphics/canvas/IMKPenCanvas.h"
-#include "moka/graphics/canvas/MKPaint.h"
 #include "moka/graphics/drawable/MKBlendedBitmapDrawable.h"
 #include "moka/graphics/drawable/MKGaussianBlurDrawable.h"
 #include "moka/graphics/drawable/MKNonPremultipliedColorDrawable.h"
 #include "moka/graphics/drawable/MKTextMaskBitmapDrawable.h"
+#include "moka/graphics/factory/MKGraphicsFactory.h"
+#include "moka/graphics/paint/MKPaint.h"
 #include "tests/support/TestImages.h"
 
 #include <memory>

@@ -2,7 +2,7 @@
 #include "moka/base/MessageLoop.h"
 #include "moka/base/String.h"
 #include "moka/graphics/bitmap/ImageDecoding.h"
-#include "moka/graphics/bitmap/MKGraphicsFactory.h"
+#include "moka/graphics/factory/MKGraphicsFactory.h"
 #include "moka/graphics/loader/MKBitmapLoader.h"
 #include "moka/graphics/loader/MKBitmapSaveManager.h"
 #include "moka/host/TaskQueue.h"

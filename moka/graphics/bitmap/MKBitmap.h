@@ -4,7 +4,7 @@
 
 #include "moka/base/Export.h"
 #include "moka/base/RefCount.h"
-#include "moka/graphics/bitmap/BitmapTag.h"
+#include "moka/base/Tag.h"
 #include "moka/graphics/bitmap/IMKBitmap.h"
 
 namespace Moka {
@@ -40,7 +40,7 @@ protected:
 
 private:
     Rect const mBitmapRect;
-    detail::BitmapTag mTag;
+    Tag mTag;
 };
 
 } // namespace Moka

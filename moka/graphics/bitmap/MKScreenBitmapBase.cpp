@@ -1,7 +1,7 @@
 #include "moka/graphics/bitmap/MKScreenBitmapBase.h"
 
 #include "moka/base/log/AndroidLog.h"
-#include "moka/graphics/bitmap/MKGraphicsFactory.h"
+#include "moka/graphics/bitmap/BitmapCreation.h"
 #include "moka/renderer/IRenderTarget.h"
 #include "moka/renderer/RendererFactory.h"
 
@@ -21,8 +21,8 @@ void MKScreenBitmapBase::CreateRenderTarget(int width, int height, FramebufferTy
 }
 
 IMKBitmap* MKScreenBitmapBase::Clone() {
-    return MKGraphicsFactory::CreateScreenBitmap(mMsgQueue, GetX(), GetY(), GetWidth(), GetHeight(),
-                                                 mFramebufferType, 1);
+    return detail::CreateScreenBitmap(mMsgQueue, GetX(), GetY(), GetWidth(), GetHeight(), mFramebufferType,
+                                      1);
 }
 
 Matrix4<float> MKScreenBitmapBase::GetProjectionMatrix() {

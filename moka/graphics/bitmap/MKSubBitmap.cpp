@@ -29,9 +29,9 @@ MKSubBitmap::MKSubBitmap(IGLMsgQueue* queue, int index, Rect const& rect, IMKSub
 MKSubBitmap::~MKSubBitmap() {
     // The render thread runs these in order: unhook, then delete what was hooked, then what it was hooked to.
     if (MKFrameBuffer* const frameBuffer = mFrameBuffer) {
-        if (OwnsDepthStencil()) {
+        if (mDepthStencil) {
             WorkerTask::PostMember(mMsgQueue, frameBuffer, &MKFrameBuffer::DetachDepthStencilBufferRT);
-            WorkerTask::PostDelete(mMsgQueue, mDepthStencil);
+            WorkerTask::PostDelete(mMsgQueue, mDepthStencil.release());
         }
         WorkerTask::PostDelete(mMsgQueue, frameBuffer);
     }
@@ -173,7 +173,7 @@ void MKSubBitmap::setTagRT(char const* tag) {
     Unref();
 }
 
-detail::BitmapTag MKSubBitmap::CopyTag() {
+Tag MKSubBitmap::CopyTag() {
     std::lock_guard<std::mutex> lock(mTagLock);
     return mTag;
 }

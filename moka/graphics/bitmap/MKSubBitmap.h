@@ -7,7 +7,7 @@
 #pragma once
 
 #include "moka/base/RefPtr.h"
-#include "moka/graphics/bitmap/BitmapTag.h"
+#include "moka/base/Tag.h"
 #include "moka/graphics/bitmap/MKSubBitmapBase.h"
 
 #include <mutex>
@@ -66,14 +66,14 @@ private:
     void setTagRT(char const* tag);
     void copyTextureRT(MKSubBitmapBase* target);
 
-    detail::BitmapTag CopyTag();
+    Tag CopyTag();
 
     // Takes the task's reference and posts. False when the task never runs.
     template <class F, class... Values>
     bool PostSelf(F function, Values&&... values);
 
     std::mutex mTagLock; // the caller writes the tag, the render thread reads it
-    detail::BitmapTag mTag;
+    Tag mTag;
 };
 
 } // namespace Moka

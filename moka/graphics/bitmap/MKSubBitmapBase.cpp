@@ -41,6 +41,8 @@ Matrix4<float> Project(Rect const& rect) {
 MKSubBitmapBase::MKSubBitmapBase(IGLMsgQueue* queue, int index, Rect const& rect)
     : mMsgQueue(queue), mIndex(index), mRect(rect), mProjection(Project(rect)) {}
 
+MKSubBitmapBase::~MKSubBitmapBase() = default;
+
 void MKSubBitmapBase::CreateTexture(int x, int y, int rowLength, void const* pixels, bool textureFlag) {
     if (mTexture) return;
     TextureDescriptor const descriptor(GetWidth(), GetHeight(), 0, 2, 6, 1, textureFlag, nullptr);
@@ -52,12 +54,17 @@ void MKSubBitmapBase::CreateTexture(ITextureObject* model) {
     mTexture = MakeTexture(TextureDescriptor(model), {});
 }
 
+bool MKSubBitmapBase::HasFrameBufferRT() const {
+    MKFrameBuffer const* const frameBuffer = mFrameBuffer;
+    return frameBuffer && frameBuffer->GetOffscreenRenderTarget();
+}
+
 void MKSubBitmapBase::CreateFrameBufferRT(bool release) {
     if (MKFrameBuffer* const frameBuffer = mFrameBuffer)
         frameBuffer->Ref();
     else if (mTexture)
         mFrameBuffer = new (std::nothrow) MKFrameBuffer(GetWidth(), GetHeight(), mTexture);
-    DropReference(release);
+    if (release) Unref();
 }
 
 void MKSubBitmapBase::ReleaseFrameBufferRT(bool release) {
@@ -67,15 +74,14 @@ void MKSubBitmapBase::ReleaseFrameBufferRT(bool release) {
         else
             frameBuffer->Unref();
     }
-    DropReference(release);
+    if (release) Unref();
 }
 
 void MKSubBitmapBase::DropLastFrameBuffer() {
     MKFrameBuffer* const frameBuffer = mFrameBuffer;
-    if (OwnsDepthStencil()) {
+    if (mDepthStencil) {
         frameBuffer->DetachDepthStencilBufferRT();
-        delete mDepthStencil;
-        mDepthStencilGone = true;
+        mDepthStencil.reset(); // the count stays
     }
     frameBuffer->Unref();
     mFrameBuffer = nullptr;
@@ -85,9 +91,9 @@ void MKSubBitmapBase::AttachDepthStencil() {
     MKFrameBuffer* const frameBuffer = mFrameBuffer;
     if (!frameBuffer) return;
     if (mDepthStencilCount == 0) {
-        mDepthStencil = new (std::nothrow) MKDepthStencilBuffer(GetWidth(), GetHeight());
+        mDepthStencil.reset(new (std::nothrow) MKDepthStencilBuffer(GetWidth(), GetHeight()));
         if (!mDepthStencil) return;
-        frameBuffer->AttachDepthStencilBufferRT(mDepthStencil);
+        frameBuffer->AttachDepthStencilBufferRT(mDepthStencil.get());
     }
     ++mDepthStencilCount;
 }
@@ -95,35 +101,31 @@ void MKSubBitmapBase::AttachDepthStencil() {
 void MKSubBitmapBase::DetachDepthStencil() {
     MKFrameBuffer* const frameBuffer = mFrameBuffer;
     if (!frameBuffer || mDepthStencilCount < 1) return;
-    if (--mDepthStencilCount > 0) return;
-    if (OwnsDepthStencil()) {
-        frameBuffer->DetachDepthStencilBufferRT();
-        delete mDepthStencil;
-    }
-    mDepthStencil = nullptr;
-    mDepthStencilGone = false;
+    if (--mDepthStencilCount > 0 || !mDepthStencil) return;
+    frameBuffer->DetachDepthStencilBufferRT();
+    mDepthStencil.reset();
 }
 
 void MKSubBitmapBase::AttachStencilBufferRT(bool release) {
     AttachDepthStencil();
-    DropReference(release);
+    if (release) Unref();
 }
 
 void MKSubBitmapBase::DetachStencilBufferRT(bool release) {
     DetachDepthStencil();
-    DropReference(release);
+    if (release) Unref();
 }
 
 void MKSubBitmapBase::ActivateFrameBufferRT(bool release) {
     if (MKFrameBuffer* const frameBuffer = mFrameBuffer) frameBuffer->ActivateFrameBufferRT();
-    DropReference(release);
+    if (release) Unref();
 }
 
 void MKSubBitmapBase::DeactivateFrameBufferRT(bool release, DiscardFramebufferType discard) {
     if (MKFrameBuffer* const frameBuffer = mFrameBuffer)
         frameBuffer->DeactivateFrameBufferRT((discard & DiscardFramebufferColor) != 0,
                                              (discard & DiscardFramebufferDepthStencil) != 0);
-    DropReference(release);
+    if (release) Unref();
 }
 
 void MKSubBitmapBase::ClearColorRT(float r, float g, float b, float a) {
@@ -137,7 +139,7 @@ void MKSubBitmapBase::ClearDepthStencilRT(bool clearDepth, float depth, bool cle
 
 void MKSubBitmapBase::ActivateTextureRT(int unit, bool release) {
     if (ITextureObject* const texture = mTexture) texture->Bind(unit);
-    DropReference(release);
+    if (release) Unref();
 }
 
 void MKSubBitmapBase::SetParameter(int id, int value) {
@@ -147,25 +149,25 @@ void MKSubBitmapBase::SetParameter(int id, int value) {
 void MKSubBitmapBase::SetTextureFilterRT(TextureParamFilteringValue value, bool release) {
     SetParameter(TextureParamFilteringMin, value);
     SetParameter(TextureParamFilteringMag, value);
-    DropReference(release);
+    if (release) Unref();
 }
 
 void MKSubBitmapBase::SetTextureFilterRT(TextureParamFiltering kind, TextureParamFilteringValue value,
                                          bool release) {
     SetParameter(kind, value);
-    DropReference(release);
+    if (release) Unref();
 }
 
 void MKSubBitmapBase::SetTextureWrapRT(TextureParamWrappingValue value, bool release) {
     SetParameter(TextureParamWrappingS, value);
     SetParameter(TextureParamWrappingT, value);
-    DropReference(release);
+    if (release) Unref();
 }
 
 void MKSubBitmapBase::SetTextureWrapRT(TextureParamWrapping kind, TextureParamWrappingValue value,
                                        bool release) {
     SetParameter(kind, value);
-    DropReference(release);
+    if (release) Unref();
 }
 
 void MKSubBitmapBase::Upload(void const* pixels, int stride) {

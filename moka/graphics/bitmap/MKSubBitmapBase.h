@@ -10,6 +10,7 @@
 #include "moka/graphics/bitmap/IMKSubBitmap.h"
 
 #include <atomic>
+#include <memory>
 
 namespace Moka {
 
@@ -19,6 +20,8 @@ class IRenderTarget;
 
 class MOKA_API MKSubBitmapBase : public IMKSubBitmap, public RefCount {
 public:
+    ~MKSubBitmapBase() override;
+
     int GetBitmapIndex() override { return mIndex; }
     int GetX() override { return mRect.left; }
     int GetY() override { return mRect.top; }
@@ -35,7 +38,7 @@ public:
     Matrix4<float> GetProjectionMatrix() override { return mProjection; }
 
     // False also when the renderer refused it.
-    bool HasFrameBufferRT() { return GetRenderTarget() != nullptr; }
+    bool HasFrameBufferRT() const;
     void CreateFrameBufferRT(bool release) override;
     void ReleaseFrameBufferRT(bool release) override;
     void AttachStencilBufferRT(bool release) override;
@@ -70,19 +73,20 @@ protected:
     // what is current would then be somebody else's.
     void CopyTextureTo(MKSubBitmapBase* target);
 
-    // Whether a depth-stencil buffer of ours exists; see mDepthStencilGone.
-    bool OwnsDepthStencil() const { return mDepthStencil && !mDepthStencilGone; }
-
     IGLMsgQueue* const mMsgQueue; // not owned
     int const mIndex;
     Rect const mRect;
     Matrix4<float> const mProjection; // asked for by every draw
-    // Atomic because they are looked at from caller threads, which may see them a moment late.
+    // Owned, and changed on the render thread alone. Atomic, and so no smart pointers, because caller threads
+    // read them, and may see them a moment late.
     std::atomic<ITextureObject*> mTexture{nullptr};
     std::atomic<MKFrameBuffer*> mFrameBuffer{nullptr};
 
-    MKDepthStencilBuffer* mDepthStencil = nullptr;
-    int mDepthStencilCount = 0;
+    // Present from the first request to the last detach, and never without a frame buffer: the frame buffer's
+    // last release deletes it but leaves the count, so that requests still open stay counted. While they are,
+    // a new frame buffer gets none.
+    std::unique_ptr<MKDepthStencilBuffer> mDepthStencil;
+    int mDepthStencilCount = 0; // requests still open
 
 private:
     void AttachDepthStencil();
@@ -90,14 +94,6 @@ private:
     void DropLastFrameBuffer();
     void SetParameter(int id, int value);
     IRenderTarget* GetRenderTarget();
-    void DropReference(bool release) {
-        if (release) Unref();
-    }
-
-    // The frame buffer's last release deletes the depth-stencil buffer but leaves pointer and count as they
-    // were, which callers rely on: requests still open stay counted. This remembers that there is nothing
-    // left to delete.
-    bool mDepthStencilGone = false;
 };
 
 } // namespace Moka

@@ -21,9 +21,9 @@ MKSubBitmapRT::MKSubBitmapRT(IGLMsgQueue* queue, int index, Rect const& rect, IT
 
 MKSubBitmapRT::~MKSubBitmapRT() {
     if (MKFrameBuffer* const frameBuffer = mFrameBuffer) {
-        if (OwnsDepthStencil()) {
+        if (mDepthStencil) {
             frameBuffer->DetachDepthStencilBufferRT();
-            delete mDepthStencil;
+            mDepthStencil.reset();
         }
         delete frameBuffer;
     }

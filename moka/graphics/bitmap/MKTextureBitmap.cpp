@@ -1,7 +1,7 @@
 #include "moka/graphics/bitmap/MKTextureBitmap.h"
 
 #include "moka/base/RefPtr.h"
-#include "moka/graphics/bitmap/MKGraphicsFactory.h"
+#include "moka/graphics/bitmap/BitmapCreation.h"
 #include "moka/graphics/bitmap/MKSubBitmap.h"
 #include "moka/graphics/bitmap/MKSubBitmapRT.h"
 #include "moka/graphics/task/WorkerTask.h"
@@ -16,13 +16,13 @@ namespace Moka {
 
 template <class Action>
 void MKTextureBitmap::ForEachStrip(Action const& action) {
-    for (int i = 0; i < mSubBitmaps.GetCount(); ++i)
-        if (IMKSubBitmap* const strip = mSubBitmaps.GetAt(i)) action(strip);
+    for (IMKSubBitmap* const strip : mSubBitmaps)
+        if (strip) action(strip);
 }
 
 template <class Action>
 void MKTextureBitmap::ForFirstStrip(Action const& action) {
-    if (IMKSubBitmap* const strip = mSubBitmaps.GetAt(0)) action(strip);
+    if (IMKSubBitmap* const strip = GetSubBitmap(0)) action(strip);
 }
 
 MKTextureBitmap::MKTextureBitmap(IGLMsgQueue* queue, int width, int height, void const* pixels,
@@ -70,7 +70,7 @@ void MKTextureBitmap::BuildStrips(Rect const& region, void const* pixels, bool r
         else
             strip =
                 new (std::nothrow) MKSubBitmap(mMsgQueue, index, rect, width, height, pixels, textureFlag);
-        if (!mSubBitmaps.Add(strip) && strip) strip->Unref();
+        AddStrip(strip);
     }
 }
 
@@ -86,7 +86,15 @@ void MKTextureBitmap::ShareStrip(int index, IMKSubBitmap* model, bool renderThre
         strip = new (std::nothrow) MKSubBitmap(mMsgQueue, index, model->GetBitmapRect(), model);
         WorkerTask::PostMember(mMsgQueue, static_cast<RefCount*>(this), &RefCount::Unref);
     }
-    if (!mSubBitmaps.Add(strip) && strip) strip->Unref();
+    AddStrip(strip);
+}
+
+void MKTextureBitmap::AddStrip(IMKSubBitmap* strip) {
+    try {
+        mSubBitmaps.push_back(strip);
+    } catch (std::bad_alloc const&) {
+        if (strip) strip->Unref();
+    }
 }
 
 // Posted behind the strips' own tasks, so that every strip has uploaded before the array goes.
@@ -100,10 +108,8 @@ void MKTextureBitmap::FreePixels(void const* pixels, bool renderThread) {
 }
 
 IMKSubBitmap* MKTextureBitmap::FindStrip(Point const& p) {
-    for (int i = 0; i < mSubBitmaps.GetCount(); ++i) {
-        IMKSubBitmap* const strip = mSubBitmaps.GetAt(i);
+    for (IMKSubBitmap* const strip : mSubBitmaps)
         if (strip && strip->GetBitmapRect().Contains(p)) return strip;
-    }
     return nullptr;
 }
 
@@ -150,7 +156,7 @@ void MKTextureBitmap::SetTag(char const* tag) {
 }
 
 IMKBitmap* MKTextureBitmap::Clone() {
-    IMKBitmap* const clone = MKGraphicsFactory::CreateBitmap(mMsgQueue, this, 1);
+    IMKBitmap* const clone = detail::CreateSharedBitmap(mMsgQueue, this, 1);
     if (clone) clone->SetTag(GetTag());
     return clone;
 }
@@ -184,7 +190,7 @@ void MKTextureBitmap::UpdateBitmap(Rect const& r, void const* pixels, int stride
 }
 
 Matrix4<float> MKTextureBitmap::GetProjectionMatrix() {
-    IMKSubBitmap* const strip = mSubBitmaps.GetAt(0);
+    IMKSubBitmap* const strip = GetSubBitmap(0);
     return strip ? strip->GetProjectionMatrix() : Matrix4<float>();
 }
 
@@ -276,7 +282,7 @@ void MKTextureBitmap::DetachFromCanvasRT(bool release) {
 
 bool MKTextureBitmap::HasFrameBufferRT(int strip) {
     // Every strip was created here.
-    auto* const wanted = static_cast<MKSubBitmapBase*>(mSubBitmaps.GetAt(strip < 0 ? 0 : strip));
+    auto* const wanted = static_cast<MKSubBitmapBase*>(GetSubBitmap(strip < 0 ? 0 : strip));
     return wanted && wanted->HasFrameBufferRT();
 }
 

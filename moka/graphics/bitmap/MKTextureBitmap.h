@@ -11,12 +11,13 @@
 // one; canvases walk the strips.
 #pragma once
 
-#include "moka/base/List.h"
 #include "moka/graphics/bitmap/IMKBitmapCanvasAttachable.h"
 #include "moka/graphics/bitmap/IMKBitmapReadable.h"
 #include "moka/graphics/bitmap/IMKBitmapWritable.h"
 #include "moka/graphics/bitmap/IMKTextureBitmap.h"
 #include "moka/graphics/bitmap/MKBitmap.h"
+
+#include <vector>
 
 namespace Moka {
 
@@ -58,8 +59,11 @@ public:
     IMKBitmapCanvasAttachable* GetBitmapCanvasAttachable() override { return this; }
     IMKTextureBitmap* GetTextureBitmap() override { return this; }
 
-    IMKSubBitmap* GetSubBitmap(int index) override { return mSubBitmaps.GetAt(index); }
-    int GetSubBitmapCount() override { return mSubBitmaps.GetCount(); }
+    IMKSubBitmap* GetSubBitmap(int index) override {
+        return index >= 0 && index < GetSubBitmapCount() ? mSubBitmaps[static_cast<std::size_t>(index)]
+                                                         : nullptr;
+    }
+    int GetSubBitmapCount() override { return static_cast<int>(mSubBitmaps.size()); }
     IMKBitmapBufferUpdatable* GetBitmapBufferUpdatable() override { return this; }
 
     void AttachStencilBufferRT(bool release) override;
@@ -106,9 +110,11 @@ private:
     void ForEachStrip(Action const& action);
     template <class Action>
     void ForFirstStrip(Action const& action);
+    // Takes the strip's first reference over. When memory runs out the strip is dropped.
+    void AddStrip(IMKSubBitmap* strip);
     IMKSubBitmap* FindStrip(Point const& p);
 
-    List<IMKSubBitmap> mSubBitmaps; // top to bottom; each entry holds its strip's first reference
+    std::vector<IMKSubBitmap*> mSubBitmaps; // top to bottom; each entry holds its strip's first reference
 };
 
 } // namespace Moka

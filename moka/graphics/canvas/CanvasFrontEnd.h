@@ -1,28 +1,45 @@
-// CanvasFrontEnd: what every canvas does on its caller's side, written once for plain and pen canvases and
-// for both ways of reaching their render side:
-//
-//     MKCanvas    DrawingFrontEnd<ByTask>  CanvasFrontEnd<IMKCanvas, MKCanvasImpl, ByTask>
-//     MKCanvasRT  DrawingFrontEnd<AtOnce>  CanvasFrontEnd<IMKCanvas, MKCanvasImpl, AtOnce>
-//     MKPenCanvas, MKPenCanvasRT           PenFrontEnd and IMKPenCanvas likewise
-//
-// ByTask posts each request, AtOnce runs it before the call returns; see CanvasReach.h. The bodies are in
-// CanvasFrontEndBodies.h, which only the sources of the four classes include. Their headers export what they
-// instantiate, since the classes they instantiate it for stay hidden.
+// CanvasFrontEnd: what every canvas does on its caller's side: clearing, the matrix, clips, the save stack, the
+// tag. DrawingCanvas (MKCanvas.h) and PenCanvas (MKPenCanvas.h) add their operations to it. kPosts tells their
+// two flavours apart: true posts each request to the render thread, false calls the render side at once.
 // Owner:  holds the render side, which dies on the render thread.
+// Thread: one at a time; not posting, the render thread.
 // Fails:  without a render side (memory ran out, or the target does not suit) the local state works on, and
-//         every request is dropped.
+//         every request is dropped. What a queue refuses is dropped; references taken for it stay.
 #pragma once
 
+#include "moka/base/Export.h"
 #include "moka/base/RefCount.h"
-#include "moka/graphics/canvas/CanvasState.h"
+#include "moka/base/Tag.h"
 #include "moka/graphics/canvas/IMKCanvasBase.h"
 
-namespace Moka::detail {
+#include <vector>
 
-struct ByTask;
-struct AtOnce;
+namespace Moka {
 
-template <class Interface, class Impl, class Reach>
+// Matrix, clip count, saved levels of both, and the tag. A value.
+class MOKA_API CanvasState {
+public:
+    Matrix3<float> matrix;
+    int clipCount = 0; // clips requested, whether or not the queue took them
+    Tag tag;
+
+    // The index of the new level. A part that the flag leaves out gets what it had in the level below, or the
+    // identity or 0 without one, so that restoring resets it. When memory runs out there is no new level, and
+    // restoring to the index does nothing.
+    int Save(IMKCanvasBase::SaveFlag flag);
+    // False, and nothing changes, for a level that does not exist. A negative one is the last.
+    bool Restore(int level);
+
+private:
+    struct Level {
+        Matrix3<float> matrix;
+        int clipCount = 0;
+    };
+
+    std::vector<Level> mLevels;
+};
+
+template <class Interface, class Impl, bool kPosts>
 class CanvasFrontEnd : public Interface, public RefCount {
 public:
     using ClipOp = IMKCanvasBase::ClipOp;
@@ -52,8 +69,8 @@ public:
     void PreTranslate(float tx, float ty) override { mState.matrix.preTranslate(tx, ty); }
     void PostTranslate(float tx, float ty) override { mState.matrix.postTranslate(tx, ty); }
 
-    void SetTag(char const* tag) override { mState.SetTag(tag); }
-    char const* GetTag() override { return mState.GetTag(); }
+    void SetTag(char const* tag) override { mState.tag.Overwrite(tag); }
+    char const* GetTag() override { return mState.tag.Get(); }
     IGLMsgQueue* GetMsgQueue() override { return mMsgQueue; }
     IMKBitmap* GetBitmap() override;
 
@@ -64,18 +81,9 @@ protected:
     // A null bitmap makes no render side.
     CanvasFrontEnd(IGLMsgQueue* queue, IMKBitmap* bitmap);
 
-    Impl* GetImpl() const { return mImpl; }
-    Matrix3<float> const& GetCurrentMatrix() const { return mState.matrix; }
-
-    // Has the render side run a function with these arguments. False when it never will: what they own then
-    // still belongs to the caller.
-    template <class Function, class... Values>
-    bool Request(Function function, Values&&... values);
-
-private:
     IGLMsgQueue* const mMsgQueue; // not owned
     Impl* const mImpl;
     CanvasState mState;
 };
 
-} // namespace Moka::detail
+} // namespace Moka

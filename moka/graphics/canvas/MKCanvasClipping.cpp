@@ -67,7 +67,9 @@ void MKCanvasClipping::RemoveClipRectRT(int count) {
 void MKCanvasClipping::EnableClipRT(int frameBuffer) {
     mActiveFrameBuffer = frameBuffer;
     if (mClips.empty()) {
-        EnableNothing();
+        mMode = Mode::None;
+        ApplyPlainState();
+        RendererFactory::GetRasterizerState()->SetScissorEnabled(false);
         return;
     }
     if (IMKBitmapWritable* const writable = FindWritable(frameBuffer)) writable->ActivateFrameBufferRT(false);
@@ -75,12 +77,6 @@ void MKCanvasClipping::EnableClipRT(int frameBuffer) {
         EnableScissor();
     else
         EnableStencil();
-}
-
-void MKCanvasClipping::EnableNothing() {
-    mMode = Mode::None;
-    ApplyPlainState();
-    RendererFactory::GetRasterizerState()->SetScissorEnabled(false);
 }
 
 void MKCanvasClipping::EnableScissor() {

@@ -38,7 +38,6 @@ public:
 private:
     enum class Mode { Stencil = 0, Scissor = 1, None = 2 };
 
-    void EnableNothing();
     void EnableScissor();
     void EnableStencil();
     void DisableScissor();

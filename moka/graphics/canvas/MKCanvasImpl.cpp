@@ -2,17 +2,18 @@
 
 #include "moka/base/RefPtr.h"
 #include "moka/base/log/AndroidLog.h"
+#include "moka/graphics/bitmap/IMKSubBitmap.h"
+#include "moka/graphics/bitmap/IMKTextureBitmap.h"
 #include "moka/graphics/canvas/SourcePiece.h"
 #include "moka/graphics/canvas/VectorOnHeap.h"
 #include "moka/graphics/drawable/IMKCustomDrawable.h"
 
 #include <algorithm>
 #include <new>
+#include <optional>
 
 namespace Moka {
 namespace {
-
-using Projection = Matrix4<float>;
 
 // The drawable, made when there is none yet. Before anything is activated: its constructor may throw.
 template <class T, class... Arguments>
@@ -71,31 +72,44 @@ MKCanvasImpl::~MKCanvasImpl() {
     mBitmapDrawable.reset();
 }
 
-template <class DrawCall>
-void MKCanvasImpl::DrawInto(IMKBitmapWritable* writable, int index, Matrix3<float> const& m,
-                            DrawCall const& draw) {
-    Drawing const ready(GetClipping(), writable, index);
-    draw(writable->GetProjectionMatrix() * FromMatrix3(m));
-}
+// Walks the frame buffers that a shape can touch, each ready to be drawn into until the next step:
+//     for (Touched frame(*this, shape, m); frame.Next();) drawable->DrawRT(..., frame.GetProjection(), paint);
+class MKCanvasImpl::Touched {
+public:
+    Touched(MKCanvasImpl const& canvas, RectF const& shape, Matrix3<float> const& m)
+        : mClipping(canvas.GetClipping()), mShape(shape), mMatrix(m), mFrame(canvas.GetBitmap()) {}
 
-template <class DrawCall>
-void MKCanvasImpl::ForEachTouched(RectF const& shape, Matrix3<float> const& m, DrawCall const& draw) {
-    ForEachFrameBuffer([&](FrameBuffer const& frame) {
-        RectF const bounds(frame.bounds);
-        if (!Touches(bounds, shape, m)) return;
-        DrawInto(frame.writable, frame.index, m,
-                 [&](Projection const& projection) { draw(projection, bounds); });
-    });
-}
+    bool Next() {
+        mDrawing.reset();
+        while (mFrame.Next()) {
+            if (!Touches(mFrame.bounds, mShape, mMatrix)) continue;
+            mDrawing.emplace(mClipping, mFrame.writable, mFrame.index);
+            return true;
+        }
+        return false;
+    }
+
+    RectF const& Bounds() const { return mFrame.bounds; }
+    Matrix4<float> GetProjection() const {
+        return mFrame.writable->GetProjectionMatrix() * FromMatrix3(mMatrix);
+    }
+
+private:
+    MKCanvasClipping* const mClipping;
+    RectF const mShape;
+    Matrix3<float> const& mMatrix;
+    FrameBuffers mFrame;
+    std::optional<Drawing> mDrawing;
+};
 
 void MKCanvasImpl::DrawRT(IMKCustomDrawable* drawable, Matrix3<float> const& m, MKPaint const& paint) {
     auto const held = RefPtr<IMKCustomDrawable>::Adopt(drawable);
     if (!held) return;
-    ForEachFrameBuffer([&](FrameBuffer const& frame) {
-        DrawInto(frame.writable, -1, m, [&](Projection const& projection) {
-            drawable->DrawRT(projection, MKPaint(paint)); // what foreign code gets is its own
-        });
-    });
+    for (FrameBuffers frame(GetBitmap()); frame.Next();) {
+        Drawing const ready(GetClipping(), frame.writable, -1);
+        // What foreign code gets is its own.
+        drawable->DrawRT(frame.writable->GetProjectionMatrix() * FromMatrix3(m), MKPaint(paint));
+    }
 }
 
 void MKCanvasImpl::DrawLineRT(PointF const& a, PointF const& b, Matrix3<float> const& m,
@@ -103,9 +117,8 @@ void MKCanvasImpl::DrawLineRT(PointF const& a, PointF const& b, Matrix3<float> c
     if (DrawsNoLine(a, b, paint)) return;
     MKLineDrawable* const drawable = FindOrMake(mLineDrawable);
     if (!drawable) return;
-    ForEachTouched(BoxOf(a, b), m, [&](Projection const& projection, RectF const&) {
-        drawable->DrawLineRT(a, b, projection, paint);
-    });
+    for (Touched frame(*this, BoxOf(a, b), m); frame.Next();)
+        drawable->DrawLineRT(a, b, frame.GetProjection(), paint);
 }
 
 void MKCanvasImpl::DrawSimpleLineRT(PointF const& a, PointF const& b, Matrix3<float> const& m,
@@ -113,9 +126,8 @@ void MKCanvasImpl::DrawSimpleLineRT(PointF const& a, PointF const& b, Matrix3<fl
     if (DrawsNoLine(a, b, paint)) return;
     MKLineDrawable* const drawable = FindOrMake(mLineDrawable);
     if (!drawable) return;
-    ForEachTouched(BoxOf(a, b), m, [&](Projection const& projection, RectF const&) {
-        drawable->DrawSimpleLineRT(a, b, projection, paint);
-    });
+    for (Touched frame(*this, BoxOf(a, b), m); frame.Next();)
+        drawable->DrawSimpleLineRT(a, b, frame.GetProjection(), paint);
 }
 
 void MKCanvasImpl::DrawSimpleLinesRT(std::vector<PointF>* points, Matrix3<float> const& m,
@@ -128,19 +140,18 @@ void MKCanvasImpl::DrawSimpleLinesRT(std::vector<PointF>* points, Matrix3<float>
     if (isFirst) LogLineDrawableCreated();
     // The drawable deletes what it is given at every call, so each of several strips gets a copy.
     bool const once = IsOneFrameBuffer(GetBitmap());
-    ForEachTouched(BoxOf(*own), m, [&](Projection const& projection, RectF const&) {
+    RectF const box = BoxOf(*own);
+    for (Touched frame(*this, box, m); frame.Next();) {
         std::vector<PointF>* const given = once ? own.release() : detail::CopyVector(*own).release();
-        if (given) drawable->DrawSimpleLinesRT(given, projection, paint);
-    });
+        if (given) drawable->DrawSimpleLinesRT(given, frame.GetProjection(), paint);
+    }
 }
 
 void MKCanvasImpl::DrawRectRT(RectF const& r, Matrix3<float> const& m, MKPaint const& paint) {
     if (HasNoExtent(r)) return;
     MKRectDrawable* const drawable = FindOrMake(mRectDrawable);
     if (!drawable) return;
-    ForEachTouched(r, m, [&](Projection const& projection, RectF const&) {
-        drawable->DrawRectRT(r, projection, paint);
-    });
+    for (Touched frame(*this, r, m); frame.Next();) drawable->DrawRectRT(r, frame.GetProjection(), paint);
 }
 
 void MKCanvasImpl::DrawRoundRectRT(RectF const& r, float rx, float ry, Matrix3<float> const& m,
@@ -148,9 +159,8 @@ void MKCanvasImpl::DrawRoundRectRT(RectF const& r, float rx, float ry, Matrix3<f
     if (HasNoExtent(r)) return;
     MKRoundRectDrawable* const drawable = FindOrMake(mRoundRectDrawable);
     if (!drawable) return;
-    ForEachTouched(r, m, [&](Projection const& projection, RectF const&) {
-        drawable->DrawRoundRectRT(r, rx, ry, projection, paint);
-    });
+    for (Touched frame(*this, r, m); frame.Next();)
+        drawable->DrawRoundRectRT(r, rx, ry, frame.GetProjection(), paint);
 }
 
 void MKCanvasImpl::DrawCircleRT(PointF const& c, float radius, Matrix3<float> const& m,
@@ -160,9 +170,8 @@ void MKCanvasImpl::DrawCircleRT(PointF const& c, float radius, Matrix3<float> co
     if (!drawable) return;
     RectF box = BoxOf(c, c);
     box.IncreaseRect(radius, radius);
-    ForEachTouched(box, m, [&](Projection const& projection, RectF const&) {
-        drawable->DrawCircleRT(c, radius, projection, paint);
-    });
+    for (Touched frame(*this, box, m); frame.Next();)
+        drawable->DrawCircleRT(c, radius, frame.GetProjection(), paint);
 }
 
 void MKCanvasImpl::DrawBitmapRT(IMKBitmap* src, RectF const& srcRect, RectF const& dstRect,
@@ -179,10 +188,9 @@ void MKCanvasImpl::DrawBitmapRT(IMKBitmap* src, RectF const& srcRect, RectF cons
 void MKCanvasImpl::DrawWhole(IMKBitmap* src, RectF const& srcRect, RectF const& dstRect,
                              Matrix3<float> const& m, MKPaint const& paint) {
     RectF const srcBounds(src->GetBitmapRect());
-    ForEachTouched(dstRect, m, [&](Projection const& projection, RectF const& bounds) {
-        mBitmapDrawable->DrawBitmapRT(src->GetBitmapReadable(), srcBounds, bounds, srcRect, dstRect,
-                                      projection, paint);
-    });
+    for (Touched frame(*this, dstRect, m); frame.Next();)
+        mBitmapDrawable->DrawBitmapRT(src->GetBitmapReadable(), srcBounds, frame.Bounds(), srcRect, dstRect,
+                                      frame.GetProjection(), paint);
 }
 
 void MKCanvasImpl::DrawInPieces(IMKBitmap* src, RectF const& srcRect, RectF const& dstRect,
@@ -195,10 +203,9 @@ void MKCanvasImpl::DrawInPieces(IMKBitmap* src, RectF const& srcRect, RectF cons
         detail::SourcePiece piece;
         if (!strip || !detail::CutToStrip(strip->GetBitmapRect(), srcRect, dstRect, piece)) continue;
         RectF const stripBounds(strip->GetBitmapRect());
-        ForEachTouched(piece.dst, m, [&](Projection const& projection, RectF const& bounds) {
-            mBitmapDrawable->DrawBitmapRT(strip, stripBounds, bounds, piece.src, piece.dst, projection,
-                                          clamped);
-        });
+        for (Touched frame(*this, piece.dst, m); frame.Next();)
+            mBitmapDrawable->DrawBitmapRT(strip, stripBounds, frame.Bounds(), piece.src, piece.dst,
+                                          frame.GetProjection(), clamped);
     }
 }
 
@@ -215,10 +222,9 @@ void MKCanvasImpl::DrawBitmapsRT(IMKBitmap* src, RectF const& srcRect, std::vect
     auto const hidden = [&](RectF const& dst) { return !Touches(bounds, dst, m); };
     dsts->erase(std::remove_if(dsts->begin(), dsts->end(), hidden), dsts->end());
     if (dsts->empty()) return;
-    DrawInto(writable, -1, m, [&](Projection const& projection) {
-        mBitmapDrawable->DrawBitmapsRT(src->GetBitmapReadable(), srcBounds, bounds, srcRect, dsts.get(),
-                                       projection, paint);
-    });
+    Drawing const ready(GetClipping(), writable, -1);
+    mBitmapDrawable->DrawBitmapsRT(src->GetBitmapReadable(), srcBounds, bounds, srcRect, dsts.get(),
+                                   writable->GetProjectionMatrix() * FromMatrix3(m), paint);
 }
 
 } // namespace Moka

@@ -12,12 +12,12 @@
 #include "moka/base/Point.h"
 #include "moka/base/Rect.h"
 #include "moka/graphics/canvas/MKCanvasImplBase.h"
-#include "moka/graphics/canvas/MKPaint.h"
 #include "moka/graphics/drawable/MKBitmapDrawable.h"
 #include "moka/graphics/drawable/MKCircleDrawable.h"
 #include "moka/graphics/drawable/MKLineDrawable.h"
 #include "moka/graphics/drawable/MKRectDrawable.h"
 #include "moka/graphics/drawable/MKRoundRectDrawable.h"
+#include "moka/graphics/paint/MKPaint.h"
 
 #include <memory>
 #include <vector>
@@ -52,12 +52,7 @@ public:
                        Matrix3<float> const& m, MKPaint const& paint);
 
 private:
-    // draw(projection, bounds) for each frame buffer that the shape can touch. The one walk of all shapes.
-    template <class DrawCall>
-    void ForEachTouched(RectF const& shape, Matrix3<float> const& m, DrawCall const& draw);
-    // draw(projection) with the frame buffer ready.
-    template <class DrawCall>
-    void DrawInto(IMKBitmapWritable* writable, int index, Matrix3<float> const& m, DrawCall const& draw);
+    class Touched;
 
     void DrawWhole(IMKBitmap* src, RectF const& srcRect, RectF const& dstRect, Matrix3<float> const& m,
                    MKPaint const& paint);

@@ -1,6 +1,8 @@
 #include "moka/graphics/canvas/MKCanvasImplBase.h"
 
 #include "moka/graphics/bitmap/IMKBitmapCanvasAttachable.h"
+#include "moka/graphics/bitmap/IMKSubBitmap.h"
+#include "moka/graphics/bitmap/IMKTextureBitmap.h"
 #include "moka/graphics/task/WorkerTask.h"
 #include "moka/renderer/RendererFactory.h"
 
@@ -21,6 +23,29 @@ MKCanvasImplBase::Target::~Target() {
     if (IMKBitmapCanvasAttachable* const attachable = bitmap->GetBitmapCanvasAttachable())
         attachable->DetachFromCanvasRT(false);
     bitmap->Unref();
+}
+
+MKCanvasImplBase::FrameBuffers::FrameBuffers(IMKBitmap* target)
+    : mTarget(target),
+      mStrips(target->GetTextureBitmap()),
+      mAttachable(target->GetBitmapCanvasAttachable()) {}
+
+bool MKCanvasImplBase::FrameBuffers::Next() {
+    if (!mStrips) {
+        writable = mIsDone ? nullptr : mTarget->GetBitmapWritable();
+        mIsDone = true;
+        if (!writable || (mAttachable && !mAttachable->HasFrameBufferRT(-1))) return false;
+        bounds = RectF(mTarget->GetBitmapRect());
+        return true;
+    }
+    while (++index < mStrips->GetSubBitmapCount()) {
+        IMKSubBitmap* const strip = mStrips->GetSubBitmap(index);
+        if (!strip || (mAttachable && !mAttachable->HasFrameBufferRT(index))) continue;
+        writable = strip;
+        bounds = RectF(strip->GetBitmapRect());
+        return true;
+    }
+    return false;
 }
 
 MKCanvasImplBase::Drawing::Drawing(MKCanvasClipping* clipping, IMKBitmapWritable* writable, int index)
@@ -59,13 +84,13 @@ bool MKCanvasImplBase::HasFrameBuffer(int index) const {
 
 void MKCanvasImplBase::ClearRT(Vector4<float> const& rgba) {
     bool const clipped = mClipping && mClipping->HasClips();
-    ForEachFrameBuffer([&](FrameBuffer const& frame) {
+    for (FrameBuffers frame(GetBitmap()); frame.Next();) {
         if (mClipping) mClipping->EnableClipRT(frame.index);
         frame.writable->ClearColorRT(rgba.x, rgba.y, rgba.z, rgba.w);
         if (mClipping) mClipping->DisableClipRT();
         // Clearing activates nothing, but the clip has.
         if (clipped) frame.writable->DeactivateFrameBufferRT(false, DiscardFramebufferNone);
-    });
+    }
 }
 
 void MKCanvasImplBase::ClearAllRT(Vector4<float> const& rgba) {
@@ -73,8 +98,8 @@ void MKCanvasImplBase::ClearAllRT(Vector4<float> const& rgba) {
     bool const scissored = rasterizer->IsScissorEnabled();
     ScissorRect const saved = scissored ? rasterizer->GetScissorRect() : ScissorRect{};
     rasterizer->SetScissorEnabled(false);
-    ForEachFrameBuffer(
-        [&](FrameBuffer const& frame) { frame.writable->ClearColorRT(rgba.x, rgba.y, rgba.z, rgba.w); });
+    for (FrameBuffers frame(GetBitmap()); frame.Next();)
+        frame.writable->ClearColorRT(rgba.x, rgba.y, rgba.z, rgba.w);
     if (!scissored) return;
     // The rectangle comes back, the test does not; the rest of the frame relies on it.
     rasterizer->SetScissorEnabled(false);

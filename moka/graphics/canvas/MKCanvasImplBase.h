@@ -6,9 +6,9 @@
 #pragma once
 
 #include "moka/base/NonAssignable.h"
+#include "moka/base/Rect.h"
 #include "moka/graphics/bitmap/IMKBitmap.h"
-#include "moka/graphics/bitmap/IMKSubBitmap.h"
-#include "moka/graphics/bitmap/IMKTextureBitmap.h"
+#include "moka/graphics/bitmap/IMKBitmapWritable.h"
 #include "moka/graphics/canvas/ClipInfo.h"
 #include "moka/graphics/canvas/MKCanvasClipping.h"
 #include "moka/graphics/math/Vector.h"
@@ -16,6 +16,9 @@
 #include <memory>
 
 namespace Moka {
+
+class IMKBitmapCanvasAttachable;
+class IMKTextureBitmap;
 
 class MKCanvasImplBase : NonAssignable {
 public:
@@ -32,11 +35,22 @@ public:
     void RemoveClipRectRT(int count);
 
 protected:
-    // One of the frame buffers that the target consists of.
-    struct FrameBuffer {
-        IMKBitmapWritable* writable;
-        Rect bounds;
-        int index; // the strip, or -1 for a target that is one frame buffer
+    // Walks the frame buffers that the target consists of, those that exist:
+    //     for (FrameBuffers frame(bitmap); frame.Next();) frame.writable->...
+    class FrameBuffers {
+    public:
+        explicit FrameBuffers(IMKBitmap* target);
+        bool Next();
+
+        IMKBitmapWritable* writable = nullptr;
+        RectF bounds;
+        int index = -1; // the strip, or -1 for a target that is one frame buffer
+
+    private:
+        IMKBitmap* const mTarget;
+        IMKTextureBitmap* const mStrips; // null for a target that is one frame buffer
+        IMKBitmapCanvasAttachable* const mAttachable;
+        bool mIsDone = false; // with the one frame buffer
     };
 
     // A frame buffer ready to be drawn into under the clip, for the scope.
@@ -61,10 +75,6 @@ protected:
     // whatever the host has bound.
     bool HasFrameBuffer(int index) const;
 
-    // Those that exist.
-    template <class Action>
-    void ForEachFrameBuffer(Action const& action) const;
-
 private:
     struct Target {
         Target(IMKBitmap* target, bool onRenderThread);
@@ -78,20 +88,5 @@ private:
     Target mTarget;
     std::unique_ptr<MKCanvasClipping> mClipping;
 };
-
-template <class Action>
-void MKCanvasImplBase::ForEachFrameBuffer(Action const& action) const {
-    IMKBitmap* const bitmap = GetBitmap();
-    IMKTextureBitmap* const tiled = bitmap->GetTextureBitmap();
-    if (!tiled) {
-        IMKBitmapWritable* const writable = bitmap->GetBitmapWritable();
-        if (writable && HasFrameBuffer(-1)) action(FrameBuffer{writable, bitmap->GetBitmapRect(), -1});
-        return;
-    }
-    for (int i = 0; i < tiled->GetSubBitmapCount(); ++i) {
-        IMKSubBitmap* const strip = tiled->GetSubBitmap(i);
-        if (strip && HasFrameBuffer(i)) action(FrameBuffer{strip, strip->GetBitmapRect(), i});
-    }
-}
 
 } // namespace Moka

@@ -1,9 +1,9 @@
 #include "moka/graphics/canvas/ScissorClip.h"
 
+#include "moka/base/Saturate.h"
+
 #include <algorithm>
-#include <cmath>
 #include <cstdint>
-#include <limits>
 
 namespace Moka::detail {
 namespace {
@@ -20,19 +20,6 @@ bool IsReplace(ClipInfo const& clip) { return clip.op == IMKCanvasBase::Replace;
 
 bool IsUpright(ClipInfo const& clip) { return clip.matrix[3] == 0; }
 
-// Towards zero, saturated.
-int Truncate(float value) {
-    if (std::isnan(value)) return 0;
-    if (value >= 2147483648.0f) return std::numeric_limits<int>::max();
-    if (value <= -2147483648.0f) return std::numeric_limits<int>::min();
-    return static_cast<int>(value);
-}
-
-int Saturate(std::int64_t value) {
-    return static_cast<int>(
-        std::clamp<std::int64_t>(value, std::numeric_limits<int>::min(), std::numeric_limits<int>::max()));
-}
-
 // No target reaches further; and the distance of two such edges is still an int.
 int ToEdge(std::int64_t value) {
     constexpr std::int64_t kFar = std::int64_t{1} << 30;
@@ -46,11 +33,11 @@ Edges GetEdges(ClipInfo const& clip, int targetY, int targetHeight) {
     float const sy = clip.matrix[4];
     float const tx = clip.matrix[6];
     float const ty = clip.matrix[7];
-    int const height = Truncate(sy * static_cast<float>(clip.height));
+    int const height = Saturate(sy * static_cast<float>(clip.height));
     Edges edges{};
-    edges.left = Truncate(sx * static_cast<float>(clip.x) + tx);
-    edges.right = edges.left + Truncate(sx * static_cast<float>(clip.width));
-    edges.bottom = Truncate(static_cast<float>(targetHeight) -
+    edges.left = Saturate(sx * static_cast<float>(clip.x) + tx);
+    edges.right = edges.left + Saturate(sx * static_cast<float>(clip.width));
+    edges.bottom = Saturate(static_cast<float>(targetHeight) -
                             (sy * static_cast<float>(clip.y) + ty + static_cast<float>(height)) +
                             static_cast<float>(targetY));
     edges.top = edges.bottom + height;

@@ -1,6 +1,11 @@
 #include "moka/graphics/debug/Checker.h"
 
 #include "moka/base/log/AndroidLog.h"
+#include "moka/graphics/debug/MKBitmapChecker.h"
+#include "moka/graphics/debug/MKCanvasChecker.h"
+#include "moka/graphics/debug/MKPenCanvasChecker.h"
+
+#include <cxxabi.h>
 
 #include <stdexcept>
 
@@ -24,4 +29,22 @@ void FailReleased(IMKCanvasBase const* canvas, char const* tag, int refCount) {
     throw std::logic_error("Canvas was already released!!");
 }
 
+void EndAsPureVirtual() { abi::__cxa_pure_virtual(); }
+
 } // namespace Moka::detail
+
+namespace Moka {
+
+MKBitmapChecker::MKBitmapChecker(IMKBitmap* bitmap) : Checker(bitmap) {}
+
+MKBitmapChecker::~MKBitmapChecker() = default;
+
+MKCanvasChecker::MKCanvasChecker(IMKCanvas* canvas) : CanvasChecker(canvas) {}
+
+MKCanvasChecker::~MKCanvasChecker() = default;
+
+MKPenCanvasChecker::MKPenCanvasChecker(IMKPenCanvas* canvas) : CanvasChecker(canvas) {}
+
+MKPenCanvasChecker::~MKPenCanvasChecker() = default;
+
+} // namespace Moka

@@ -16,7 +16,7 @@
 
 #include "moka/base/CriticalSection.h"
 #include "moka/base/Export.h"
-#include "moka/graphics/bitmap/BitmapTag.h"
+#include "moka/base/Tag.h"
 
 #include <atomic>
 
@@ -80,7 +80,7 @@ private:
 
     CriticalSection mLock; // held to change the count; it is read without
     Interface* const mWrapped;
-    BitmapTag mTag;
+    Tag mTag;
     std::atomic<int> mRefCount{1};
 };
 

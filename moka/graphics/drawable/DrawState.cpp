@@ -11,6 +11,11 @@ DrawState::DrawState()
     : mBlend(RendererFactory::CreateBlendStateObject(BlendStateDescriptor(true))),
       mDepthStencil(RendererFactory::CreateDepthStencilState(DepthStencilStateDescriptor(false, false))) {}
 
+void DrawState::Apply(MKPaint::XFermode mode) {
+    ApplyBlend(mode);
+    mDepthStencil->Apply();
+}
+
 void DrawState::ApplyBlend(MKPaint::XFermode mode) {
     mBlend->SetDescriptor(MKGraphicsUtil::GetBlendingStateDescriptor(mode));
     mBlend->Apply();

@@ -3,8 +3,8 @@
 // Fails:  a state that the renderer refused makes it false; whoever draws asks first.
 #pragma once
 
-#include "moka/graphics/canvas/MKPaint.h"
 #include "moka/graphics/drawable/RendererPtr.h"
+#include "moka/graphics/paint/MKPaint.h"
 #include "moka/renderer/IBlendStateObject.h"
 #include "moka/renderer/IDepthStencilState.h"
 
@@ -17,7 +17,9 @@ public:
 
     explicit operator bool() const { return mBlend && mDepthStencil; }
 
-    // Both ask for a state that is true. A mode is set at each draw: the renderer knows what is in force.
+    // These need a state that is true. A mode is set at each draw; the renderer leaves out what is unchanged.
+    void Apply(MKPaint::XFermode mode);
+    // The two halves of it, for those who set more in between.
     void ApplyBlend(MKPaint::XFermode mode);
     void ApplyDepthStencil() { mDepthStencil->Apply(); }
 

@@ -2,9 +2,9 @@
 // Thread: render thread.
 #pragma once
 
-#include "moka/graphics/canvas/MKPaint.h"
 #include "moka/graphics/drawable/RendererPtr.h"
 #include "moka/graphics/drawable/Shaders.h"
+#include "moka/graphics/paint/MKPaint.h"
 #include "moka/renderer/RendererFactory.h"
 
 #include <initializer_list>
@@ -39,12 +39,12 @@ void UseShader(Shader& shader, Matrix4<float> const& projection, MKPaint const& 
 
 inline bool DrawAll(IGraphicsObject& graphics) { return graphics.Draw(0, -1, 1); }
 
-inline bool IsFilled(MKPaint const& paint) {
-    return paint.GetStyle() == MKPaint::Fill || paint.GetStyle() == MKPaint::FillAndStroke;
+inline bool IsFilled(MKPaint::Style style) {
+    return style == MKPaint::Fill || style == MKPaint::FillAndStroke;
 }
 
-inline bool IsStroked(MKPaint const& paint) {
-    return paint.GetStyle() == MKPaint::FillAndStroke || paint.GetStyle() == MKPaint::Stroke;
+inline bool IsStroked(MKPaint::Style style) {
+    return style == MKPaint::FillAndStroke || style == MKPaint::Stroke;
 }
 
 } // namespace Moka::detail

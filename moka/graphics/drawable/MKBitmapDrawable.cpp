@@ -1,9 +1,9 @@
 #include "moka/graphics/drawable/MKBitmapDrawable.h"
 
+#include "moka/graphics/bitmap/BitmapCreation.h"
 #include "moka/graphics/bitmap/IMKBitmapReadable.h"
 #include "moka/graphics/bitmap/IMKSubBitmap.h"
 #include "moka/graphics/bitmap/IMKTextureBitmap.h"
-#include "moka/graphics/bitmap/MKGraphicsFactory.h"
 #include "moka/graphics/drawable/Drawing.h"
 #include "moka/graphics/drawable/FringeGeometry.h"
 #include "moka/graphics/drawable/MKGraphicsUtil.h"
@@ -141,9 +141,9 @@ bool MKBitmapDrawable::DarkenOrLighten(IMKBitmapReadable* bitmap, RectF const& t
 bool MKBitmapDrawable::CopyDestination(RectF const& targetBounds, char const* tag) {
     if (!mDestination || !HasSizeOf(*mDestination, targetBounds)) {
         mDestination = {};
-        mDestination = RefPtr<IMKBitmap>::Adopt(
-            MKGraphicsFactory::CreateBitmap(mQueue, ToSize(targetBounds.GetWidth()),
-                                            ToSize(targetBounds.GetHeight()), nullptr, false, 0, false));
+        mDestination = RefPtr<IMKBitmap>::Adopt(CreateTextureBitmap(mQueue, ToSize(targetBounds.GetWidth()),
+                                                                    ToSize(targetBounds.GetHeight()), nullptr,
+                                                                    false, 0, false));
         if (!mDestination) return false;
         mDestination->SetTag(tag);
     }

@@ -12,11 +12,11 @@
 #include "moka/base/Rect.h"
 #include "moka/base/RefPtr.h"
 #include "moka/graphics/bitmap/IMKBitmap.h"
-#include "moka/graphics/canvas/MKPaint.h"
 #include "moka/graphics/drawable/DrawState.h"
 #include "moka/graphics/drawable/RendererPtr.h"
 #include "moka/graphics/drawable/ShaderPtr.h"
 #include "moka/graphics/math/Matrix4.h"
+#include "moka/graphics/paint/MKPaint.h"
 #include "moka/renderer/IGraphicsObject.h"
 
 #include <vector>

@@ -21,24 +21,24 @@ void MKCircleDrawable::DrawCircleRT(PointF const& center, float radius, Matrix4<
                                     MKPaint const& paint) {
     if (!mGraphics || !mState || !mShader) return;
     float const width = paint.GetLineWidth();
+    bool const isStroked = IsStroked(paint.GetStyle());
     float reach = radius + 0.5f;
-    if (IsStroked(paint)) reach += width * 0.5f + 1.0f;
+    if (isStroked) reach += width * 0.5f + 1.0f;
     RectF const box = Grown({center.x, center.y, center.x, center.y}, reach);
     PointF vertices[kQuadVertices];
     WriteQuad(vertices, {box.left, box.top}, {box.left, box.bottom}, {box.right, box.top},
               {box.right, box.bottom});
 
     mGraphics->SetVertices(0, vertices, kQuadVertices);
-    mState.ApplyBlend(paint.GetXFermode());
-    mState.ApplyDepthStencil();
+    mState.Apply(paint.GetXFermode());
     UseShader(*mShader, projection, paint);
     mShader->uCenter = Vector2<float>(center.x, center.y);
     mShader->uRadius = radius;
-    if (IsFilled(paint)) {
+    if (IsFilled(paint.GetStyle())) {
         mShader->uIsFill = 1;
         DrawAll(*mGraphics);
     }
-    if (IsStroked(paint) && width > 0.0f) {
+    if (isStroked && width > 0.0f) {
         mShader->uIsFill = 0;
         mShader->uStrokeWidth = width;
         DrawAll(*mGraphics);

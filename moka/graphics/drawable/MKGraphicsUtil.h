@@ -1,7 +1,7 @@
 // MKGraphicsUtil: what a paint's settings mean to the renderer.
 #pragma once
 
-#include "moka/graphics/canvas/MKPaint.h"
+#include "moka/graphics/paint/MKPaint.h"
 #include "moka/renderer/BlendStateDescriptor.h"
 
 namespace Moka {

@@ -124,8 +124,7 @@ void MKLineDrawable::DrawLineRT(PointF const& start, PointF const& end, Matrix4<
     WriteLine(vertices, start, end, length, width * 0.5f + 0.5f);
 
     mLineGraphics->SetVertices(0, vertices, kQuadVertices);
-    mState.ApplyBlend(paint.GetXFermode());
-    mState.ApplyDepthStencil();
+    mState.Apply(paint.GetXFermode());
     UseShader(*mLineShader, projection, paint);
     mLineShader->uLineInfo = Vector2<float>(width * 0.5f, length);
     SetDashes(*mLineShader, paint.GetDashedLinePattern());
@@ -164,8 +163,7 @@ void MKLineDrawable::DrawSimpleVertices(void const* vertices, int count, Matrix4
                                         MKPaint const& paint) {
     if (!mSimpleGraphics || !mState || !mRectShader) return;
     mSimpleGraphics->SetVertices(0, vertices, count);
-    mState.ApplyBlend(paint.GetXFermode());
-    mState.ApplyDepthStencil();
+    mState.Apply(paint.GetXFermode());
     UseShader(*mRectShader, projection, paint);
     DrawAll(*mSimpleGraphics);
 }

@@ -22,13 +22,13 @@ bool MKRectDrawable::DrawRectRT(RectF const& rect, Matrix4<float> const& project
     CoverageVertex vertices[kMostFillVertices + kMostStrokeVertices];
     CoverageVertex* end = vertices;
     bool const antiAliased = paint.IsAntiAliasing();
-    if (IsFilled(paint)) end = WriteFill(end, rect, antiAliased, CoverageCorners);
-    if (IsStroked(paint) && paint.GetLineWidth() >= 1.0f)
+    MKPaint::Style const style = paint.GetStyle();
+    if (IsFilled(style)) end = WriteFill(end, rect, antiAliased, CoverageCorners);
+    if (IsStroked(style) && paint.GetLineWidth() >= 1.0f)
         end = WriteStroke(end, rect, paint.GetLineWidth() * 0.5f, antiAliased);
 
     mGraphics->SetVertices(0, vertices, static_cast<int>(end - vertices));
-    mState.ApplyBlend(paint.GetXFermode());
-    mState.ApplyDepthStencil();
+    mState.Apply(paint.GetXFermode());
     UseShader(*mShader, projection, paint);
     return DrawAll(*mGraphics);
 }

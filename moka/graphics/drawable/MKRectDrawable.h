@@ -9,11 +9,11 @@
 
 #include "moka/base/NonAssignable.h"
 #include "moka/base/Rect.h"
-#include "moka/graphics/canvas/MKPaint.h"
 #include "moka/graphics/drawable/DrawState.h"
 #include "moka/graphics/drawable/RendererPtr.h"
 #include "moka/graphics/drawable/ShaderPtr.h"
 #include "moka/graphics/math/Matrix4.h"
+#include "moka/graphics/paint/MKPaint.h"
 #include "moka/renderer/IGraphicsObject.h"
 
 namespace Moka {

@@ -108,11 +108,11 @@ bool MKRoundRectDrawable::DrawRoundRectRT(RectF const& rect, float rx, float ry,
                                           Matrix4<float> const& projection, MKPaint const& paint) {
     if (!mBodyGraphics || !mCornerGraphics || !mState || !mBodyShader || !mCornerShader) return false;
     Shape const shape(rect, rx, ry);
-    mState.ApplyBlend(paint.GetXFermode());
-    mState.ApplyDepthStencil();
+    mState.Apply(paint.GetXFermode());
     bool drawn = true;
-    if (IsFilled(paint)) drawn = DrawFill(shape, projection, paint);
-    if (IsStroked(paint) && paint.GetLineWidth() >= 1.0f) drawn = DrawStroke(shape, projection, paint);
+    MKPaint::Style const style = paint.GetStyle();
+    if (IsFilled(style)) drawn = DrawFill(shape, projection, paint);
+    if (IsStroked(style) && paint.GetLineWidth() >= 1.0f) drawn = DrawStroke(shape, projection, paint);
     return drawn;
 }
 

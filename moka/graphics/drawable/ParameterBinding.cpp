@@ -31,11 +31,8 @@ IParameterBinding* LookUpParameter(IShaderProgram* program, char const* name, Bi
     Throw<InvalidArgumentException>("ParameterBinding<>::bind - invalid parameter type!");
 }
 
-void SetParameter(IParameterBinding* handle, void const* value) {
-    if (!handle) {
-        Throw<NotSupportedException>("ParameterBinding: internal interface is not initialized!");
-    }
-    handle->Set(value); // cppcheck-suppress nullPointerRedundantCheck ; Throw does not return
+void ThrowUnbound() {
+    Throw<NotSupportedException>("ParameterBinding: internal interface is not initialized!");
 }
 
 } // namespace detail

@@ -48,7 +48,7 @@ struct BindingValue<BindingTypeTextureUnit> {
 
 // What does not depend on the type. A look-up that throws has released its handle.
 MOKA_API IParameterBinding* LookUpParameter(IShaderProgram* program, char const* name, BindingType wanted);
-MOKA_API void SetParameter(IParameterBinding* handle, void const* value);
+[[noreturn]] MOKA_API void ThrowUnbound();
 
 } // namespace detail
 
@@ -71,7 +71,8 @@ public:
 
     // Throws NotSupportedException while unbound.
     ParameterBinding& operator=(Value const& value) {
-        detail::SetParameter(mHandle, &value);
+        if (!mHandle) detail::ThrowUnbound();
+        mHandle->Set(&value);
         return *this;
     }
 

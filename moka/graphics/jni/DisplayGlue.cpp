@@ -1,5 +1,5 @@
 // The natives of com.velmora.android.sdk.pen.view.MokaDisplay.
-#include "moka/base/log/AndroidLog.h"
+#include "moka/base/log/InfoLog.h"
 #include "moka/graphics/jni/Display.h"
 #include "moka/graphics/jni/OnLoad.h"
 
@@ -10,9 +10,7 @@
 namespace Moka {
 namespace {
 
-constexpr char const* kTag = "DisplayGlue";
-
-void LogInfo(char const* text) { __android_log_print(ANDROID_LOG_INFO, kTag, "%s", text); }
+constexpr InfoLog LogInfo{"DisplayGlue"};
 
 // A handle is the object's address. But for Native_finalize, Java never passes 0.
 struct DisplayGlue {

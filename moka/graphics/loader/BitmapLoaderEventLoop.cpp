@@ -5,7 +5,7 @@
 #include "moka/base/BitmapFactory.h"
 #include "moka/base/RunGuarded.h"
 #include "moka/graphics/bitmap/IMKBitmap.h"
-#include "moka/graphics/bitmap/MKGraphicsFactory.h"
+#include "moka/graphics/factory/MKGraphicsFactory.h"
 #include "moka/graphics/loader/BitmapLoaderInterface.h"
 #include "moka/graphics/loader/LoaderLog.h"
 #include "moka/graphics/loader/PathForLog.h"

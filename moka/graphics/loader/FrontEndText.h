@@ -1,6 +1,4 @@
-// FrontEndText: in what the two front ends differ: the kind of bitmap they ask for and the texts they log.
-// Each text begins with the front end's address and name; those that end in Path show the path, in
-// engineering builds.
+// FrontEndText: what the two front ends log, and in what they differ.
 #pragma once
 
 #include "moka/graphics/loader/Request.h"
@@ -12,54 +10,43 @@ class IMKBitmap;
 
 namespace detail {
 
+// By the kind of bitmap: its name in a request, and the class's, which is also its log tag.
 template <class BitmapT>
-struct FrontEndText;
+struct FrontEndKind;
 
 template <>
-struct FrontEndText<IMKBitmap> {
+struct FrontEndKind<IMKBitmap> {
     static constexpr BitmapType kType = BITMAP_TYPE_GRAPHICS;
-    static constexpr char const* kTag = "MKBitmapLoader";
-    static constexpr char const* kDestructor = "MKBitmapLoader[%p:%s] ~MKBitmapLoader";
-    static constexpr char const* kRequestLoad = "MKBitmapLoader[%p:%s] RequestLoad(%d) ret %s";
-    static constexpr char const* kRequestLoadPath = "MKBitmapLoader[%p:%s] RequestLoad(%d, %s) ret %s";
-    static constexpr char const* kCancelLoad = "MKBitmapLoader[%p:%s] CancelLoadRequest(%d)";
-    static constexpr char const* kCancelAllLoad = "MKBitmapLoader[%p:%s] CancelAllLoadRequest()";
-    static constexpr char const* kRequestSave = "MKBitmapLoader[%p:%s] RequestSave(%p) ret %s";
-    static constexpr char const* kRequestSavePath = "MKBitmapLoader[%p:%s] RequestSave(%s, %p) ret %s";
-    static constexpr char const* kOnLoad = "MKBitmapLoader[%p:%s] OnLoad(%d, %p)";
-    static constexpr char const* kOnLoadPath = "MKBitmapLoader[%p:%s] OnLoad(%d, %s, %p)";
-    static constexpr char const* kOnLoadList = "MKBitmapLoader[%p:%s] OnLoadList(%d, %p, size%d)";
-    static constexpr char const* kOnLoadListPath = "MKBitmapLoader[%p:%s] OnLoadList(%d, %s, %p, size%d)";
-    static constexpr char const* kOnLoadError = "MKBitmapLoader[%p:%s] OnLoadError(%d)";
-    static constexpr char const* kOnLoadErrorPath = "MKBitmapLoader[%p:%s] OnLoadError(%d, %s)";
-    static constexpr char const* kOnSave = "MKBitmapLoader[%p:%s] OnSave";
-    static constexpr char const* kOnSavePath = "MKBitmapLoader[%p:%s] OnSave(%s)";
-    static constexpr char const* kOnSaveError = "MKBitmapLoader[%p:%s] OnSaveError";
-    static constexpr char const* kOnSaveErrorPath = "MKBitmapLoader[%p:%s] OnSaveError(%s)";
+    static constexpr char const* kClass = "MKBitmapLoader";
 };
 
 template <>
-struct FrontEndText<Bitmap> {
+struct FrontEndKind<Bitmap> {
     static constexpr BitmapType kType = BITMAP_TYPE_CPU;
-    static constexpr char const* kTag = "BitmapLoader";
-    static constexpr char const* kDestructor = "BitmapLoader[%p:%s] ~BitmapLoader";
-    static constexpr char const* kRequestLoad = "BitmapLoader[%p:%s] RequestLoad(%d) ret %s";
-    static constexpr char const* kRequestLoadPath = "BitmapLoader[%p:%s] RequestLoad(%d, %s) ret %s";
-    static constexpr char const* kCancelLoad = "BitmapLoader[%p:%s] CancelLoadRequest(%d)";
-    static constexpr char const* kCancelAllLoad = "BitmapLoader[%p:%s] CancelAllLoadRequest()";
-    static constexpr char const* kRequestSave = "BitmapLoader[%p:%s] RequestSave(%p) ret %s";
-    static constexpr char const* kRequestSavePath = "BitmapLoader[%p:%s] RequestSave(%s, %p) ret %s";
-    static constexpr char const* kOnLoad = "BitmapLoader[%p:%s] OnLoad(%d, %p)";
-    static constexpr char const* kOnLoadPath = "BitmapLoader[%p:%s] OnLoad(%d, %s, %p)";
-    static constexpr char const* kOnLoadList = "BitmapLoader[%p:%s] OnLoadList(%d, %p, size%d)";
-    static constexpr char const* kOnLoadListPath = "BitmapLoader[%p:%s] OnLoadList(%d, %s, %p, size%d)";
-    static constexpr char const* kOnLoadError = "BitmapLoader[%p:%s] OnLoadError(%d)";
-    static constexpr char const* kOnLoadErrorPath = "BitmapLoader[%p:%s] OnLoadError(%d, %s)";
-    static constexpr char const* kOnSave = "BitmapLoader[%p:%s] OnSave";
-    static constexpr char const* kOnSavePath = "BitmapLoader[%p:%s] OnSave(%s)";
-    static constexpr char const* kOnSaveError = "BitmapLoader[%p:%s] OnSaveError";
-    static constexpr char const* kOnSaveErrorPath = "BitmapLoader[%p:%s] OnSaveError(%s)";
+    static constexpr char const* kClass = "BitmapLoader";
 };
+
+// Each text begins with the class, the front end's address and its name. Those that end in Path show the path,
+// in engineering builds.
+namespace FrontEndText {
+constexpr char const* kDestructor = "%s[%p:%s] ~%s";
+constexpr char const* kRequestLoad = "%s[%p:%s] RequestLoad(%d) ret %s";
+constexpr char const* kRequestLoadPath = "%s[%p:%s] RequestLoad(%d, %s) ret %s";
+constexpr char const* kCancelLoad = "%s[%p:%s] CancelLoadRequest(%d)";
+constexpr char const* kCancelAllLoad = "%s[%p:%s] CancelAllLoadRequest()";
+constexpr char const* kRequestSave = "%s[%p:%s] RequestSave(%p) ret %s";
+constexpr char const* kRequestSavePath = "%s[%p:%s] RequestSave(%s, %p) ret %s";
+constexpr char const* kOnLoad = "%s[%p:%s] OnLoad(%d, %p)";
+constexpr char const* kOnLoadPath = "%s[%p:%s] OnLoad(%d, %s, %p)";
+constexpr char const* kOnLoadList = "%s[%p:%s] OnLoadList(%d, %p, size%d)";
+constexpr char const* kOnLoadListPath = "%s[%p:%s] OnLoadList(%d, %s, %p, size%d)";
+constexpr char const* kOnLoadError = "%s[%p:%s] OnLoadError(%d)";
+constexpr char const* kOnLoadErrorPath = "%s[%p:%s] OnLoadError(%d, %s)";
+constexpr char const* kOnSave = "%s[%p:%s] OnSave";
+constexpr char const* kOnSavePath = "%s[%p:%s] OnSave(%s)";
+constexpr char const* kOnSaveError = "%s[%p:%s] OnSaveError";
+constexpr char const* kOnSaveErrorPath = "%s[%p:%s] OnSaveError(%s)";
+} // namespace FrontEndText
 
 } // namespace detail
 } // namespace Moka

@@ -29,7 +29,8 @@ template <class B>
 template <class... Values>
 void LoaderFrontEnd<B>::Print(char const* format, Values... values) const {
     if (!mName) return;
-    __android_log_print(ANDROID_LOG_INFO, FrontEndText<B>::kTag, format, AddressOf(this), mName, values...);
+    __android_log_print(ANDROID_LOG_INFO, FrontEndKind<B>::kClass, format, FrontEndKind<B>::kClass,
+                        AddressOf(this), mName, values...);
 }
 
 template <class B>
@@ -37,7 +38,7 @@ LoaderFrontEnd<B>::LoaderFrontEnd(char const* name, Callback* callback) : mName(
     try {
         if (callback) mCallback = *callback;
     } catch (std::bad_alloc const&) {
-        __android_log_print(ANDROID_LOG_ERROR, FrontEndText<B>::kTag,
+        __android_log_print(ANDROID_LOG_ERROR, FrontEndKind<B>::kClass,
                             "%s: out of memory for the callbacks; none will be called",
                             mName ? mName : "(no name)");
         mCallback = Callback();
@@ -46,7 +47,7 @@ LoaderFrontEnd<B>::LoaderFrontEnd(char const* name, Callback* callback) : mName(
 
 template <class B>
 void LoaderFrontEnd<B>::Detach() {
-    Print(FrontEndText<B>::kDestructor);
+    Print(FrontEndText::kDestructor, FrontEndKind<B>::kClass);
     Loader().CancelAllLoadRequest(this);
     Loader().RemoveAllSaveCallback(this);
     WaitForCallback();
@@ -60,12 +61,12 @@ bool LoaderFrontEnd<B>::RequestLoad(int id, String const& path, IGLMsgQueue* que
 template <class B>
 bool LoaderFrontEnd<B>::RequestLoad(int id, String const& path, IGLMsgQueue* queue, int width, int height) {
     bool const isAccepted =
-        Loader().RequestLoad(this, id, path, FrontEndText<B>::kType, queue, width, height);
+        Loader().RequestLoad(this, id, path, FrontEndKind<B>::kType, queue, width, height);
     LoggedPath const shown(path);
     if (shown.IsShown()) {
-        Print(FrontEndText<B>::kRequestLoadPath, id, shown.Get(), ToWord(isAccepted));
+        Print(FrontEndText::kRequestLoadPath, id, shown.Get(), ToWord(isAccepted));
     } else {
-        Print(FrontEndText<B>::kRequestLoad, id, ToWord(isAccepted));
+        Print(FrontEndText::kRequestLoad, id, ToWord(isAccepted));
     }
     return isAccepted;
 }
@@ -73,13 +74,13 @@ bool LoaderFrontEnd<B>::RequestLoad(int id, String const& path, IGLMsgQueue* que
 template <class B>
 void LoaderFrontEnd<B>::CancelLoadRequest(int id) {
     Loader().CancelLoadRequest(this, id);
-    Print(FrontEndText<B>::kCancelLoad, id);
+    Print(FrontEndText::kCancelLoad, id);
 }
 
 template <class B>
 void LoaderFrontEnd<B>::CancelAllLoadRequest() {
     Loader().CancelAllLoadRequest(this);
-    Print(FrontEndText<B>::kCancelAllLoad);
+    Print(FrontEndText::kCancelAllLoad);
 }
 
 template <class B>
@@ -93,9 +94,9 @@ template <class B>
 bool LoaderFrontEnd<B>::LogSave(String const& path, void const* source, bool isAccepted) const {
     LoggedPath const shown(path);
     if (shown.IsShown()) {
-        Print(FrontEndText<B>::kRequestSavePath, shown.Get(), source, ToWord(isAccepted));
+        Print(FrontEndText::kRequestSavePath, shown.Get(), source, ToWord(isAccepted));
     } else {
-        Print(FrontEndText<B>::kRequestSave, source, ToWord(isAccepted));
+        Print(FrontEndText::kRequestSave, source, ToWord(isAccepted));
     }
     return isAccepted;
 }
@@ -136,9 +137,9 @@ template <class B>
 void LoaderFrontEnd<B>::OnLoad(int id, String const& path, B& bitmap) {
     LoggedPath const shown(path);
     if (shown.IsShown()) {
-        Print(FrontEndText<B>::kOnLoadPath, id, shown.Get(), AddressOf(&bitmap));
+        Print(FrontEndText::kOnLoadPath, id, shown.Get(), AddressOf(&bitmap));
     } else {
-        Print(FrontEndText<B>::kOnLoad, id, AddressOf(&bitmap));
+        Print(FrontEndText::kOnLoad, id, AddressOf(&bitmap));
     }
     if (mCallback.onLoad) mCallback.onLoad(id, path, bitmap);
 }
@@ -148,9 +149,9 @@ void LoaderFrontEnd<B>::OnLoadList(int id, String const& path, std::vector<B*>& 
     LoggedPath const shown(path);
     int const count = static_cast<int>(bitmaps.size());
     if (shown.IsShown()) {
-        Print(FrontEndText<B>::kOnLoadListPath, id, shown.Get(), AddressOf(&bitmaps), count);
+        Print(FrontEndText::kOnLoadListPath, id, shown.Get(), AddressOf(&bitmaps), count);
     } else {
-        Print(FrontEndText<B>::kOnLoadList, id, AddressOf(&bitmaps), count);
+        Print(FrontEndText::kOnLoadList, id, AddressOf(&bitmaps), count);
     }
     if (mCallback.onLoadList) mCallback.onLoadList(id, path, bitmaps);
 }
@@ -159,9 +160,9 @@ template <class B>
 void LoaderFrontEnd<B>::OnLoadError(int id, String const& path) {
     LoggedPath const shown(path);
     if (shown.IsShown()) {
-        Print(FrontEndText<B>::kOnLoadErrorPath, id, shown.Get());
+        Print(FrontEndText::kOnLoadErrorPath, id, shown.Get());
     } else {
-        Print(FrontEndText<B>::kOnLoadError, id);
+        Print(FrontEndText::kOnLoadError, id);
     }
     if (mCallback.onLoadError) mCallback.onLoadError(id, path);
 }
@@ -170,9 +171,9 @@ template <class B>
 void LoaderFrontEnd<B>::OnSave(int id, String const& path, void* userData) {
     LoggedPath const shown(path);
     if (shown.IsShown()) {
-        Print(FrontEndText<B>::kOnSavePath, shown.Get());
+        Print(FrontEndText::kOnSavePath, shown.Get());
     } else {
-        Print(FrontEndText<B>::kOnSave);
+        Print(FrontEndText::kOnSave);
     }
     if (mCallback.onSave) mCallback.onSave(id, path, userData);
 }
@@ -181,23 +182,23 @@ template <class B>
 void LoaderFrontEnd<B>::OnSaveError(int id, String const& path, void* userData) {
     LoggedPath const shown(path);
     if (shown.IsShown()) {
-        Print(FrontEndText<B>::kOnSaveErrorPath, shown.Get());
+        Print(FrontEndText::kOnSaveErrorPath, shown.Get());
     } else {
-        Print(FrontEndText<B>::kOnSaveError);
+        Print(FrontEndText::kOnSaveError);
     }
     if (mCallback.onSaveError) mCallback.onSaveError(id, path, userData);
 }
 
 template <class B>
 void LoaderFrontEnd<B>::OnCallbackPending() {
-    __android_log_print(ANDROID_LOG_INFO, FrontEndText<B>::kTag, "%s", "OnCallbackPending");
+    __android_log_print(ANDROID_LOG_INFO, FrontEndKind<B>::kClass, "%s", "OnCallbackPending");
     AutoCriticalSection const lock(mLock);
     mCallbackPending = true;
 }
 
 template <class B>
 void LoaderFrontEnd<B>::OnCallbackCompleted() {
-    __android_log_print(ANDROID_LOG_INFO, FrontEndText<B>::kTag, "%s", "OnCallbackCompleted");
+    __android_log_print(ANDROID_LOG_INFO, FrontEndKind<B>::kClass, "%s", "OnCallbackCompleted");
     AutoCriticalSection const lock(mLock);
     mCallbackPending = false;
     mCondition.Signal();

@@ -1,17 +1,12 @@
 // LoaderLog.h: the log lines of the loader itself.
 #pragma once
 
-#include "moka/base/log/AndroidLog.h"
+#include "moka/base/log/InfoLog.h"
 
 namespace Moka::detail {
 
 constexpr char const* kLoaderTag = "BitmapLoaderImpl";
 
-inline void LogInfo(char const* text) { __android_log_print(ANDROID_LOG_INFO, kLoaderTag, "%s", text); }
-
-template <class... Values>
-void LogInfo(char const* format, Values... values) {
-    __android_log_print(ANDROID_LOG_INFO, kLoaderTag, format, values...);
-}
+constexpr InfoLog LogInfo{kLoaderTag};
 
 } // namespace Moka::detail

@@ -3,7 +3,7 @@
 #include "moka/base/Handler.h"
 #include "moka/base/MessageLoop.h"
 #include "moka/base/RunGuarded.h"
-#include "moka/base/log/AndroidLog.h"
+#include "moka/base/log/InfoLog.h"
 #include "moka/graphics/bitmap/IMKBitmap.h"
 #include "moka/graphics/loader/MKBitmapLoader.h"
 #include "moka/graphics/task/IGLMsgQueue.h"
@@ -16,10 +16,7 @@ namespace {
 
 constexpr char const* kTag = "mok_log";
 
-template <class... Values>
-void LogInfo(char const* format, Values... values) {
-    __android_log_print(ANDROID_LOG_INFO, kTag, format, values...);
-}
+constexpr InfoLog LogInfo{kTag};
 
 } // namespace
 

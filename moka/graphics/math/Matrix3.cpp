@@ -42,19 +42,21 @@ void Adjugate(T const* m, T (&a)[9]) {
 }
 
 template <class T>
-PointF MapPoint(T const* m, T x, T y) {
-    T const w = m[2] * x + m[5] * y + m[8];
-    return {(m[0] * x + m[3] * y + m[6]) / w, (m[1] * x + m[4] * y + m[7]) / w};
-}
-
-template <class T>
 RectF MapCorners(T const* m, T left, T top, T right, T bottom) {
-    PointF const first = MapPoint(m, left, top);
-    PointF const others[] = {MapPoint(m, right, bottom), MapPoint(m, right, top), MapPoint(m, left, bottom)};
-    RectF box;
-    box.Set(first.x, first.y, first.x, first.y);
-    for (PointF const& corner : others) box.MakeRect(corner.x, corner.y);
-    return box;
+    T const xs[] = {left, right, right, left};
+    T const ys[] = {top, bottom, top, bottom};
+    T boxLeft = 0, boxTop = 0, boxRight = 0, boxBottom = 0;
+    for (int i = 0; i < 4; ++i) {
+        T const w = m[2] * xs[i] + m[5] * ys[i] + m[8];
+        T const x = (m[0] * xs[i] + m[3] * ys[i] + m[6]) / w;
+        T const y = (m[1] * xs[i] + m[4] * ys[i] + m[7]) / w;
+        // Only a first corner that is not a number leaves its trace.
+        if (i == 0 || x < boxLeft) boxLeft = x;
+        if (i == 0 || x > boxRight) boxRight = x;
+        if (i == 0 || y < boxTop) boxTop = y;
+        if (i == 0 || y > boxBottom) boxBottom = y;
+    }
+    return {boxLeft, boxTop, boxRight, boxBottom};
 }
 
 } // namespace

@@ -162,15 +162,14 @@ Matrix4<T> Matrix4<T>::rotateMatrix(Vector3<T> dir, Vector3<T> up) {
 template <class T>
 Matrix4<T> Matrix4<T>::operator*(Matrix4 const& right) const {
     T const* const l = mElements;
-    Matrix4 result;
+    T product[16];
     for (int column = 0; column < 4; ++column) {
         T const* const r = right.mElements + 4 * column;
-        T sums[4];
         for (int row = 0; row < 4; ++row)
-            sums[row] = l[row] * r[0] + l[4 + row] * r[1] + l[8 + row] * r[2] + l[12 + row] * r[3];
-        std::copy_n(sums, 4, result.mElements + 4 * column);
+            product[4 * column + row] =
+                l[row] * r[0] + l[4 + row] * r[1] + l[8 + row] * r[2] + l[12 + row] * r[3];
     }
-    return result;
+    return Matrix4(product);
 }
 
 template <class T>
@@ -261,7 +260,8 @@ void Matrix4<T>::rotateSelf(T ax, T ay, T az) {
 
 template class Matrix4<float>;
 
-Matrix4<float> FromMatrix3(Matrix3<float> const& m) {
+Matrix4<float> FromMatrix3(Matrix3<float> const& matrix) {
+    float const* const m = matrix.data();
     return {m[0], m[1], 0, m[2], m[3], m[4], 0, m[5], 0, 0, 1, 0, m[6], m[7], 0, m[8]};
 }
 

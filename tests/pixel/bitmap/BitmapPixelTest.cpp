@@ -6,7 +6,7 @@
 #include "moka/graphics/bitmap/IMKBitmapWritable.h"
 #include "moka/graphics/bitmap/IMKSubBitmap.h"
 #include "moka/graphics/bitmap/IMKTextureBitmap.h"
-#include "moka/graphics/bitmap/MKGraphicsFactory.h"
+#include "moka/graphics/factory/MKGraphicsFactory.h"
 #include "moka/host/RenderThread.h"
 #include "moka/renderer/IRendererDeviceCaps.h"
 #include "moka/renderer/RendererFactory.h"

@@ -1,6 +1,6 @@
 // Input that makes no sense: nothing crashes, no GL error, and the next draw is right. And input that the
 // caller changes at once: it has been copied.
-#include "moka/graphics/bitmap/MKGraphicsFactory.h"
+#include "moka/graphics/factory/MKGraphicsFactory.h"
 #include "moka/graphics/task/ITask.h"
 #include "tests/pixel/canvas/CanvasDrawing.h"
 

@@ -1,7 +1,7 @@
 #include "tests/pixel/canvas/CanvasDrawing.h"
 
 #include "moka/base/log/AndroidLog.h"
-#include "moka/graphics/bitmap/MKGraphicsFactory.h"
+#include "moka/graphics/factory/MKGraphicsFactory.h"
 #include "moka/renderer/RendererFactory.h"
 #include "tests/support/NothingLeft.h"
 #include "tests/support/reference/ReferenceStage.h"

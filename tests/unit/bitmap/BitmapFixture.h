@@ -5,8 +5,8 @@
 
 #include "moka/base/RefPtr.h"
 #include "moka/graphics/bitmap/IMKSubBitmap.h"
-#include "moka/graphics/bitmap/MKGraphicsFactory.h"
 #include "moka/graphics/bitmap/MKTextureBitmap.h"
+#include "moka/graphics/factory/MKGraphicsFactory.h"
 #include "moka/renderer/ITextureObject.h"
 #include "moka/renderer/RendererFactory.h"
 #include "tests/support/Queues.h"

@@ -4,8 +4,8 @@
 
 #include "moka/graphics/canvas/IMKCanvas.h"
 #include "moka/graphics/canvas/IMKPenCanvas.h"
-#include "moka/graphics/canvas/MKPaint.h"
 #include "moka/graphics/drawable/IMKCustomDrawable.h"
+#include "moka/graphics/paint/MKPaint.h"
 #include "tests/support/LogCapture.h"
 #include "tests/unit/bitmap/BitmapFixture.h"
 

@@ -3,8 +3,8 @@
 #pragma once
 
 #include "moka/graphics/canvas/IMKCanvas.h"
-#include "moka/graphics/canvas/MKPaint.h"
 #include "moka/graphics/math/Matrix3.h"
+#include "moka/graphics/paint/MKPaint.h"
 
 #include <gtest/gtest.h>
 

@@ -1,4 +1,4 @@
-#include "moka/graphics/canvas/MKPaint.h"
+#include "moka/graphics/paint/MKPaint.h"
 
 #include <gtest/gtest.h>
 

@@ -1,7 +1,7 @@
 // DrawableFixture: drawables over the tracing renderer, and what reached it of them.
 #pragma once
 
-#include "moka/graphics/canvas/MKPaint.h"
+#include "moka/graphics/paint/MKPaint.h"
 #include "moka/renderer/IBlendStateObject.h"
 #include "moka/renderer/IDepthStencilState.h"
 #include "tests/unit/drawable/ShaderFixture.h"

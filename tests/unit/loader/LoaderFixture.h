@@ -10,7 +10,7 @@
 #include "moka/base/log/AndroidLog.h"
 #include "moka/graphics/bitmap/IMKBitmap.h"
 #include "moka/graphics/bitmap/ImageDecoding.h"
-#include "moka/graphics/bitmap/MKGraphicsFactory.h"
+#include "moka/graphics/factory/MKGraphicsFactory.h"
 #include "moka/graphics/loader/BitmapLoaderImpl.h"
 #include "moka/graphics/loader/MKBitmapLoader.h"
 #include "tests/support/LogCapture.h"

@@ -1,7 +1,7 @@
 // The end of a process whose loader sleeps, works or waits. Each case ends a process of its own, which must
 // come to its end, with no crash and no leak that a sanitizer would report.
 #include "moka/graphics/bitmap/ImageDecoding.h"
-#include "moka/graphics/bitmap/MKGraphicsFactory.h"
+#include "moka/graphics/factory/MKGraphicsFactory.h"
 #include "moka/graphics/loader/MKBitmapLoader.h"
 #include "moka/renderer/RendererFactory.h"
 #include "tests/support/LogCapture.h"

@@ -5,7 +5,7 @@
 #include "moka/base/RefCount.h"
 #include "moka/base/RefPtr.h"
 #include "moka/graphics/canvas/IMKCanvas.h"
-#include "moka/graphics/canvas/MKPaint.h"
+#include "moka/graphics/paint/MKPaint.h"
 #include "scenes/Scene.h"
 
 #include <sstream>

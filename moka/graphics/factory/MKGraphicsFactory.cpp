@@ -1,12 +1,10 @@
-#include "moka/graphics/bitmap/MKGraphicsFactory.h"
+#include "moka/graphics/factory/MKGraphicsFactory.h"
 
 #include "moka/base/Bitmap.h"
 #include "moka/base/BitmapFactory.h"
-#include "moka/base/log/AndroidLog.h"
+#include "moka/graphics/bitmap/BitmapCreation.h"
 #include "moka/graphics/bitmap/ImageDecoding.h"
-#include "moka/graphics/bitmap/MKScreenBitmap.h"
-#include "moka/graphics/bitmap/MKScreenBitmapRT.h"
-#include "moka/graphics/bitmap/MKSharedTextureBitmap.h"
+#include "moka/graphics/bitmap/MKTextureBitmap.h"
 #include "moka/graphics/canvas/MKCanvas.h"
 #include "moka/graphics/canvas/MKCanvasRT.h"
 #include "moka/graphics/canvas/MKPenCanvas.h"
@@ -19,33 +17,18 @@
 namespace Moka {
 namespace {
 
-bool IsValid(IGLMsgQueue* queue, int width, int height) {
-    if (queue && width >= 1 && height >= 1) return true;
-    __android_log_print(ANDROID_LOG_ERROR, "mok_log",
-                        "%s, bitmap is not created!, bitmap width = %d, height = %d, queue=%p",
-                        "CreateBitmap", width, height, static_cast<void*>(queue));
-    return false;
-}
-
 bool CanPost(IGLMsgQueue* queue, int useQueue) { return queue || useQueue == 0; }
-
-void LogInvalidParent(IMKBitmap* parent, char const* tag) {
-    __android_log_print(ANDROID_LOG_ERROR, "mok_log", "%s, invalid parent bitmap (%p:\"%s\")", "CreateBitmap",
-                        static_cast<void*>(parent), tag);
-}
 
 } // namespace
 
 IMKBitmap* MKGraphicsFactory::CreateBitmap(IGLMsgQueue* queue, int width, int height, void const* pixels,
                                            bool deleteBuffer, int useQueue, bool textureFlag) {
-    if (!IsValid(queue, width, height)) return nullptr;
-    return new (std::nothrow)
-        MKTextureBitmap(queue, width, height, pixels, deleteBuffer, useQueue == 0, textureFlag);
+    return detail::CreateTextureBitmap(queue, width, height, pixels, deleteBuffer, useQueue, textureFlag);
 }
 
 IMKBitmap* MKGraphicsFactory::CreateBitmap(IGLMsgQueue* queue, Rect const& region, int width, int height,
                                            void const* pixels, int useQueue) {
-    if (!IsValid(queue, width, height)) return nullptr;
+    if (!detail::IsValidBitmap(queue, width, height)) return nullptr;
     Rect const clipped = region.Intersect(Rect(0, 0, width, height));
     if (clipped.IsEmpty()) return nullptr;
     // useQueue decides who owns the pixels here, and the strips are always caller-side; relied upon.
@@ -53,16 +36,7 @@ IMKBitmap* MKGraphicsFactory::CreateBitmap(IGLMsgQueue* queue, Rect const& regio
 }
 
 IMKBitmap* MKGraphicsFactory::CreateBitmap(IGLMsgQueue* queue, IMKBitmap* parent, int useQueue) {
-    if (!parent) {
-        LogInvalidParent(parent, "---");
-        return nullptr;
-    }
-    if (!parent->GetTextureBitmap()) {
-        LogInvalidParent(parent, parent->GetTag());
-        return nullptr;
-    }
-    if (!CanPost(queue, useQueue)) return nullptr;
-    return new (std::nothrow) MKSharedTextureBitmap(queue, parent, useQueue == 0);
+    return detail::CreateSharedBitmap(queue, parent, useQueue);
 }
 
 IMKBitmap* MKGraphicsFactory::CreateBitmap(IGLMsgQueue* queue, String const* path, int useQueue) {
@@ -75,7 +49,7 @@ IMKBitmap* MKGraphicsFactory::CreateBitmap(IGLMsgQueue* queue, String const* pat
     if (!decoded) return nullptr;
     // The buffer passes to the texture bitmap. A request refused below loses it; relied upon.
     decoded->SetDeleteBuffer(false);
-    if (!IsValid(queue, decoded->GetWidth(), decoded->GetHeight())) return nullptr;
+    if (!detail::IsValidBitmap(queue, decoded->GetWidth(), decoded->GetHeight())) return nullptr;
     IMKBitmap* const bitmap = new (std::nothrow) MKTextureBitmap(
         queue, decoded->GetWidth(), decoded->GetHeight(), decoded->GetBuffer(), true, useQueue == 0, false);
     if (!bitmap) decoded->SetDeleteBuffer(true);
@@ -108,11 +82,7 @@ Bitmap* MKGraphicsFactory::CreateScaledCPUBitmap(String const* path, int width, 
 
 IMKBitmap* MKGraphicsFactory::CreateScreenBitmap(IGLMsgQueue* queue, int x, int y, int width, int height,
                                                  int useDefaultFramebuffer, int useQueue) {
-    auto const type =
-        useDefaultFramebuffer != 0 ? MKBitmap::DefaultFramebuffer : MKBitmap::CurrentFramebuffer;
-    if (!CanPost(queue, useQueue)) return nullptr;
-    if (useQueue == 0) return new (std::nothrow) MKScreenBitmapRT(queue, x, y, width, height, type);
-    return new (std::nothrow) MKScreenBitmap(queue, x, y, width, height, type);
+    return detail::CreateScreenBitmap(queue, x, y, width, height, useDefaultFramebuffer, useQueue);
 }
 
 void MKGraphicsFactory::RefBitmap(IMKBitmap* bitmap) {

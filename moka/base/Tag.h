@@ -1,0 +1,34 @@
+// Tag: a label of at most 126 bytes, for logs and debuggers. The limit is one fewer than would fit: callers
+// depend on where a long tag is cut.
+#pragma once
+
+#include <cstddef>
+#include <cstring>
+
+namespace Moka {
+
+class Tag {
+public:
+    // Null is ignored; a tag may be set to itself.
+    void Set(char const* text) {
+        if (text) mText[Write(text)] = '\0';
+    }
+    // The same, but a shorter text does not end an earlier, longer one.
+    void Overwrite(char const* text) {
+        if (text) Write(text);
+    }
+    char const* Get() const { return mText; }
+
+private:
+    static constexpr std::size_t kMaxLength = 126;
+
+    std::size_t Write(char const* text) {
+        std::size_t const length = strnlen(text, kMaxLength);
+        std::memmove(mText, text, length);
+        return length;
+    }
+
+    char mText[kMaxLength + 2] = {}; // what is behind the limit stays zero
+};
+
+} // namespace Moka
