@@ -6,47 +6,16 @@
 #include "moka/host/RenderThread.h"
 #include "moka/renderer/RendererFactory.h"
 
-#include <GLES3/gl3.h>
-
 #include <algorithm>
-#include <array>
 #include <cmath>
-#include <stdexcept>
-#include <string>
 
 namespace Moka::Tool {
 namespace {
 
 using Scenes::InkPoint;
 
-constexpr char kVertexShader[] = R"(#version 300 es
-uniform mat4 uMatrix;
-layout(location = 0) in vec2 aPosition;
-layout(location = 1) in vec2 aAcross; // from the middle, and the ink's radius there
-out highp vec2 vAcross;
-void main() {
-    vAcross = aAcross;
-    gl_Position = uMatrix * vec4(aPosition, 0.0, 1.0);
-}
-)";
-
-constexpr char kFragmentShader[] = R"(#version 300 es
-precision highp float;
-uniform vec4 uColor;
-in highp vec2 vAcross;
-out vec4 oColor;
-void main() {
-    oColor = uColor * clamp(vAcross.y + 0.5 - abs(vAcross.x), 0.0, 1.0);
-}
-)";
-
 // Half of the feather lies outside the ink.
 constexpr float kFeather = 0.5f;
-
-struct Vertex {
-    float x, y;
-    float across, radius;
-};
 
 struct Direction {
     float x, y;
@@ -61,8 +30,8 @@ Direction DirectionAt(std::vector<InkPoint> const& points, std::size_t i) {
     return {(to.x - from.x) / length, (to.y - from.y) / length};
 }
 
-std::vector<Vertex> MakeStrip(std::vector<InkPoint> const& points) {
-    std::vector<Vertex> strip;
+std::vector<InkVertex> MakeStrip(std::vector<InkPoint> const& points) {
+    std::vector<InkVertex> strip;
     strip.reserve(points.size() * 2);
     for (std::size_t i = 0; i < points.size(); ++i) {
         auto const [x, y, radius] = points[i];
@@ -73,67 +42,7 @@ std::vector<Vertex> MakeStrip(std::vector<InkPoint> const& points) {
     return strip;
 }
 
-void Compile(GLuint program, GLenum stage, char const* source) {
-    GLuint const shader = glCreateShader(stage);
-    glShaderSource(shader, 1, &source, nullptr);
-    glCompileShader(shader);
-    glAttachShader(program, shader);
-    glDeleteShader(shader); // the program keeps it
-}
-
-void Link(GLuint program) {
-    Compile(program, GL_VERTEX_SHADER, kVertexShader);
-    Compile(program, GL_FRAGMENT_SHADER, kFragmentShader);
-    glLinkProgram(program);
-    GLint isLinked = 0;
-    glGetProgramiv(program, GL_LINK_STATUS, &isLinked);
-    if (isLinked) return;
-    std::array<char, 512> text{};
-    glGetProgramInfoLog(program, static_cast<GLsizei>(text.size()), nullptr, text.data());
-    throw std::runtime_error(std::string("the driver refuses the ink's program: ") + text.data());
-}
-
 } // namespace
-
-struct PenStroke::GlInk {
-    GLuint program = glCreateProgram();
-    GLuint vertexArray = 0;
-    GLuint buffer = 0;
-
-    GlInk() {
-        glGenVertexArrays(1, &vertexArray);
-        glGenBuffers(1, &buffer);
-    }
-    ~GlInk() {
-        glDeleteBuffers(1, &buffer);
-        glDeleteVertexArrays(1, &vertexArray);
-        glDeleteProgram(program);
-    }
-    GlInk(GlInk const&) = delete;
-    GlInk& operator=(GlInk const&) = delete;
-
-    // Sets all that it depends on, but target, viewport, clip and masks, and gives nothing back.
-    void Draw(Matrix4<float> const& matrix, std::vector<Vertex> const& strip,
-              Vector4<float> const& color) const {
-        glUseProgram(program);
-        glUniformMatrix4fv(glGetUniformLocation(program, "uMatrix"), 1, GL_FALSE, matrix.data());
-        glUniform4f(glGetUniformLocation(program, "uColor"), color.x, color.y, color.z, color.w);
-        glBindVertexArray(vertexArray);
-        glBindBuffer(GL_ARRAY_BUFFER, buffer);
-        glBufferData(GL_ARRAY_BUFFER, static_cast<GLsizeiptr>(strip.size() * sizeof(Vertex)), strip.data(),
-                     GL_STREAM_DRAW);
-        for (GLuint i = 0; i < 2; ++i) {
-            std::uintptr_t const offset = std::uintptr_t{i} * 2 * sizeof(float);
-            glEnableVertexAttribArray(i);
-            glVertexAttribPointer(i, 2, GL_FLOAT, GL_FALSE, sizeof(Vertex),
-                                  reinterpret_cast<void const*>(offset));
-        }
-        glEnable(GL_BLEND);
-        glBlendEquation(GL_FUNC_ADD);
-        glBlendFunc(GL_ONE, GL_ONE_MINUS_SRC_ALPHA);
-        glDrawArrays(GL_TRIANGLE_STRIP, 0, static_cast<GLsizei>(strip.size()));
-    }
-};
 
 PenStroke::PenStroke(RenderThread& thread) : mThread(thread) {}
 
@@ -150,13 +59,9 @@ void PenStroke::DrawStroke(IMKPenCanvas& canvas, std::vector<InkPoint> const& po
                            Vector4<float> const& color) {
     IMKBitmap* const bitmap = canvas.GetBitmap();
     if (!bitmap || points.size() < 2) return;
-    std::vector<Vertex> const strip = MakeStrip(points);
+    std::vector<InkVertex> const strip = MakeStrip(points);
     mThread.Call([&] {
-        if (!mInk) {
-            auto ink = std::make_unique<GlInk>();
-            Link(ink->program);
-            mInk = std::move(ink);
-        }
+        if (!mInk) mInk = GlInk::Create();
         canvas.EnableClipRT(0);
         bitmap->GetBitmapWritable()->ActivateFrameBufferRT(false);
         mInk->Draw(canvas.GetCanvasMatrix(), strip, color);

@@ -5,6 +5,7 @@
 // Fails:  a driver that refuses the program leaves one error line and no ink.
 #pragma once
 
+#include "apps/moka/GlInk.h"
 #include "scenes/ScenePen.h"
 
 #include <memory>
@@ -25,8 +26,6 @@ public:
                     Vector4<float> const& color) override;
 
 private:
-    struct GlInk;
-
     RenderThread& mThread;
     std::unique_ptr<GlInk> mInk; // render thread
 };

@@ -1,38 +1,12 @@
 #include "tests/pixel/pen/ForeignInk.h"
 
+#include <GLES3/gl3.h>
+
 #include <gtest/gtest.h>
 
 namespace Moka::Testing {
-namespace {
 
-constexpr char kVertexShader[] = R"(#version 300 es
-uniform mat4 uMatrix;
-layout(location = 0) in vec2 aPosition;
-void main() { gl_Position = uMatrix * vec4(aPosition, 0.0, 1.0); }
-)";
-
-constexpr char kFragmentShader[] = R"(#version 300 es
-precision highp float;
-out vec4 oColor;
-void main() { oColor = vec4(0.0, 1.0, 0.0, 1.0); }
-)";
-
-void Compile(GLuint program, GLenum stage, char const* source) {
-    GLuint const shader = glCreateShader(stage);
-    glShaderSource(shader, 1, &source, nullptr);
-    glCompileShader(shader);
-    glAttachShader(program, shader);
-    glDeleteShader(shader);
-}
-
-} // namespace
-
-ForeignInk::ForeignInk() : mProgram(glCreateProgram()) {
-    Compile(mProgram, GL_VERTEX_SHADER, kVertexShader);
-    Compile(mProgram, GL_FRAGMENT_SHADER, kFragmentShader);
-    glLinkProgram(mProgram);
-    glGenVertexArrays(1, &mVertexArray);
-    glGenBuffers(1, &mBuffer);
+ForeignInk::ForeignInk() : mInk(Tool::GlInk::Create()) {
     glGenTextures(1, &mTexture);
     glGenSamplers(1, &mSampler);
 }
@@ -40,25 +14,19 @@ ForeignInk::ForeignInk() : mProgram(glCreateProgram()) {
 ForeignInk::~ForeignInk() {
     glDeleteSamplers(1, &mSampler);
     glDeleteTextures(1, &mTexture);
-    glDeleteBuffers(1, &mBuffer);
-    glDeleteVertexArrays(1, &mVertexArray);
-    glDeleteProgram(mProgram);
+    mInk.reset();
     EXPECT_EQ(glGetError(), static_cast<GLenum>(GL_NO_ERROR));
 }
 
 void ForeignInk::Fill(RectF const& rect, Matrix4<float> const& matrix) const {
     EXPECT_EQ(glGetError(), static_cast<GLenum>(GL_NO_ERROR));
-    GLfloat const corners[] = {rect.left, rect.top, rect.left,  rect.bottom, rect.right, rect.bottom,
-                               rect.left, rect.top, rect.right, rect.bottom, rect.right, rect.top};
-    glUseProgram(mProgram);
-    glUniformMatrix4fv(glGetUniformLocation(mProgram, "uMatrix"), 1, GL_FALSE, matrix.data());
-    glBindVertexArray(mVertexArray);
-    glBindBuffer(GL_ARRAY_BUFFER, mBuffer);
-    glBufferData(GL_ARRAY_BUFFER, sizeof(corners), corners, GL_STREAM_DRAW);
-    glEnableVertexAttribArray(0);
-    glVertexAttribPointer(0, 2, GL_FLOAT, GL_FALSE, 0, nullptr);
-    glDisable(GL_BLEND);
-    glDrawArrays(GL_TRIANGLES, 0, 6);
+    // In the middle of ink that is wide enough to be solid.
+    mInk->Draw(matrix,
+               {{rect.left, rect.top, 0, 1},
+                {rect.left, rect.bottom, 0, 1},
+                {rect.right, rect.top, 0, 1},
+                {rect.right, rect.bottom, 0, 1}},
+               {0, 1, 0, 1});
     EXPECT_EQ(glGetError(), static_cast<GLenum>(GL_NO_ERROR));
 }
 
@@ -87,8 +55,7 @@ void ForeignInk::LeaveAMess() const {
     glPixelStorei(GL_PACK_ROW_LENGTH, 3);
     glBindFramebuffer(GL_FRAMEBUFFER, 0);
     glClearColor(1, 0, 1, 1);
-    glUseProgram(mProgram);
-    glBindVertexArray(mVertexArray);
+    mInk->Bind();
     EXPECT_EQ(glGetError(), static_cast<GLenum>(GL_NO_ERROR));
 }
 

@@ -2,10 +2,11 @@
 // Thread: render thread.
 #pragma once
 
+#include "apps/moka/GlInk.h"
 #include "moka/base/Rect.h"
 #include "moka/graphics/math/Matrix4.h"
 
-#include <GLES3/gl3.h>
+#include <memory>
 
 namespace Moka::Testing {
 
@@ -16,19 +17,16 @@ public:
     ForeignInk(ForeignInk const&) = delete;
     ForeignInk& operator=(ForeignInk const&) = delete;
 
-    // Fills the rectangle with green, blending off, into what is bound, within the clip, viewport and masks
-    // in force.
+    // Fills the rectangle with opaque green, into what is bound, within the clip, viewport and masks in force.
     void Fill(RectF const& rect, Matrix4<float> const& matrix) const;
 
     // Leaves everything that a draw depends on so that nothing could be drawn with it, or the wrong thing.
     void LeaveAMess() const;
 
 private:
-    GLuint mProgram = 0;
-    GLuint mVertexArray = 0;
-    GLuint mBuffer = 0;
-    GLuint mTexture = 0;
-    GLuint mSampler = 0;
+    std::unique_ptr<Tool::GlInk> mInk;
+    unsigned mTexture = 0;
+    unsigned mSampler = 0;
 };
 
 } // namespace Moka::Testing
