@@ -190,8 +190,12 @@ class Workspace:
             self.baselines[preset] = known if known.get("tree") == self.tree_hash else {"tree": self.tree_hash}
         seconds = self.baselines[preset]
         if program not in seconds:
-            start = time.monotonic()
-            failure = self.run(preset, program, 600)
+            # Twice, since a busy machine can be too slow for a test once.
+            for _ in range(2):
+                start = time.monotonic()
+                failure = self.run(preset, program, 600)
+                if not failure:
+                    break
             if failure:
                 raise WorkspaceError(f"{program} ({preset}) fails without a fault: {failure}")
             seconds[program] = time.monotonic() - start
