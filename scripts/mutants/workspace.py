@@ -16,17 +16,16 @@ from mutants.faults import plant
 
 # What decides which fault is seen.
 WATCHED = ("CMakeLists.txt", "CMakePresets.json", "apps", "cmake", "java", "moka", "scenes", "tests")
-# Entries of CTest that are no GoogleTest program of their name, by the beginning of theirs: what they need built.
-CTEST_TARGETS = {
-    "moka_java": ("moka_jvm_host", "moka_jvm_test_programs", "moka_jvm_test_no_natives",
-                  "moka_jvm_test_no_constructor", "moka_graphics"),
-    "moka_drawable_shaders": (),
-    "moka_loading": ("moka_log", "moka_base", "moka_renderer_gles", "moka_graphics", "moka_host"),
-    "moka_pixel_window_tests": ("moka_pixel_window_tests",),
-    "moka_samples": ("moka_samples",),
-    "moka_soak_recording": ("moka_soak_recording",),
-    "moka_soak_gles": ("moka_soak_gles",),
-    "readme.Draw": ("moka_readme", "moka_readme_check"),
+# Entries of CTest that are no GoogleTest program of their name, by the beginning of theirs: the folder that has them
+# (CTest looks through the others for nothing), and what they need built.
+ENTRIES = {
+    "moka_java": ("tests/jvm", ("moka_jvm_host", "moka_jvm_test_programs", "moka_jvm_test_no_natives",
+                                "moka_jvm_test_no_constructor", "moka_graphics")),
+    "moka_drawable_shaders": ("tests/unit/drawable", ()),
+    "moka_pixel_window_tests": ("tests/pixel/host", ("moka_pixel_window_tests",)),
+    "moka_soak_gles": ("tests/trust", ("moka_soak_gles",)),
+    "moka_soak_recording": ("tests/trust", ("moka_soak_recording",)),
+    "readme.Draw": ("tests/readme", ("moka_readme", "moka_readme_check")),
 }
 MEMORY_LIMIT = 16 << 30  # bytes of address space: a fault may allocate without end
 PATIENCE = 5  # times as long as without a fault, then a program hangs
@@ -97,8 +96,9 @@ class Workspace:
         if shutil.which("ccache"):
             # The objects of the working tree's own build then serve here as well.
             environment.setdefault("CMAKE_CXX_COMPILER_LAUNCHER", "ccache")
-        # A changed library changes what runs against it without linking it anew.
-        command = ["cmake", "--preset", preset, "-DMOKA_BUILD_BENCHMARKS=OFF", "-DCMAKE_LINK_DEPENDS_NO_SHARED=ON"]
+        # A changed library changes what runs against it without linking it anew; and linking takes the longest.
+        command = ["cmake", "--preset", preset, "-DMOKA_BUILD_BENCHMARKS=OFF", "-DCMAKE_LINK_DEPENDS_NO_SHARED=ON",
+                   "-DCMAKE_EXE_LINKER_FLAGS=-Wl,--strip-debug", "-DCMAKE_SHARED_LINKER_FLAGS=-Wl,--strip-debug"]
         self._run(command, environment)
         self._compiled = {os.path.relpath(entry["file"], self.tree) for entry in
                           json.loads((self.build_folder(preset) / "compile_commands.json").read_text())}
@@ -115,11 +115,13 @@ class Workspace:
 
     # --- building
 
+    def entry_of(self, program):
+        """None for a GoogleTest program."""
+        return ENTRIES.get(program.partition(".")[0], ENTRIES.get(program))
+
     def targets_of(self, program):
-        for beginning, targets in CTEST_TARGETS.items():
-            if program == beginning or program.startswith(beginning + "."):
-                return targets
-        return (program,)
+        entry = self.entry_of(program)
+        return entry[1] if entry else (program,)
 
     def build(self, preset, programs):
         """None, or the compiler's complaint."""
@@ -153,14 +155,13 @@ class Workspace:
 
     def _command(self, preset, program):
         build = self.build_folder(preset)
-        if self.targets_of(program) == (program,) and program != "moka_pixel_window_tests":
-            found = [path for path in build.glob(f"tests/**/{program}") if path.is_file()]
-            if not found:
-                raise WorkspaceError(f"there is no test program '{program}'; see tests/mutants/programs")
-            return [str(found[0]), "--gtest_brief=1", "--gtest_color=no", "--gtest_fail_fast"], found[0].parent
-        name = "^" + re.escape(program) + ("$" if program in CTEST_TARGETS else "")
-        return ["ctest", "--test-dir", str(build), "-R", name, "--no-tests=error", "--stop-on-failure",
-                "--output-on-failure"], build
+        if entry := self.entry_of(program):
+            return ["ctest", "--test-dir", str(build / entry[0]), "-R", "^" + re.escape(program), "--no-tests=error",
+                    "--stop-on-failure", "--output-on-failure"], build
+        found = [path for path in build.glob(f"tests/**/{program}") if path.is_file()]
+        if not found:
+            raise WorkspaceError(f"there is no test program '{program}'; see tests/mutants/programs")
+        return [str(found[0]), "--gtest_brief=1", "--gtest_color=no", "--gtest_fail_fast"], found[0].parent
 
     def run(self, preset, program, limit):
         """None when it passes; otherwise what failed first, in a few words."""
