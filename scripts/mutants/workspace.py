@@ -201,7 +201,7 @@ class Workspace:
                 raise WorkspaceError(f"{program} ({preset}) fails without a fault: {failure}")
             seconds[program] = time.monotonic() - start
             kept.write_text(json.dumps(seconds, indent=1))
-        return 20 + PATIENCE * seconds[program]
+        return 10 + PATIENCE * seconds[program]
 
     def has_limit(self, preset, program):
         return program in self.baselines.get(preset, {})
