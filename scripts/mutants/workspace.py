@@ -28,7 +28,7 @@ ENTRIES = {
     "readme.Draw": ("tests/readme", ("moka_readme", "moka_readme_check")),
 }
 MEMORY_LIMIT = 16 << 30  # bytes of address space: a fault may allocate without end
-PATIENCE = 5  # times as long as without a fault, then a program hangs
+PATIENCE = 3  # times as long as without a fault, then a program hangs
 
 
 class WorkspaceError(Exception):
