@@ -63,7 +63,7 @@ protected:
     InterruptionTest() { Save(MakeNoise(2000), "in.mki"); }
 
     bool WaitFor(std::function<bool()> const& isSo) const {
-        for (int i = 0; i < 10000; ++i) {
+        for (int i = 0; i < 30000; ++i) {
             if (isSo()) return true;
             std::this_thread::sleep_for(std::chrono::milliseconds(1));
         }

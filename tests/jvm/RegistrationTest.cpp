@@ -61,6 +61,24 @@ TEST(Registration, DisplayHasFiveNativesInOrder) {
     EXPECT_THAT(LoadDisplay(-1), ElementsAre("Display JNI_OnLoad enter!!", "RegisterNatives is failed"));
 }
 
+class CountedDisplay : public Display {
+public:
+    CountedDisplay()
+        : Display(1, 1, 1, 1, 1, 1, 1, 1, 1, 1, LayoutDirection{0}, Orientation{0}, ScreenOrientation{0},
+                  false, false, 0) {}
+    ~CountedDisplay() override { ++destroyed; }
+
+    static inline int destroyed = 0;
+};
+
+TEST(Registration, FinalizeDestroysTheDisplay) {
+    LoadDisplay(0);
+    Display const* const display = new CountedDisplay;
+    auto const handle = static_cast<jlong>(reinterpret_cast<std::intptr_t>(display));
+    GetNative<void(JNIEnv*, jclass, jlong)>(1)(nullptr, nullptr, handle);
+    EXPECT_EQ(CountedDisplay::destroyed, 1);
+}
+
 // The VM itself hands natives 0 and 1 only.
 TEST(Registration, AnyTruthOfJavasMakesATablet) {
     LoadDisplay(0);

@@ -11,6 +11,7 @@
 #include <cerrno>
 #include <csignal>
 #include <fstream>
+#include <gmock/gmock.h>
 #include <gtest/gtest.h>
 #include <iterator>
 #include <memory>
@@ -86,6 +87,8 @@ TEST_P(FileFault, ASaveShowsTheOldFileOrTheWholeNewOne) {
     std::string const oldBytes = ReadFile();
     int const count = Disturb(Mode::Fail, 0, 0, [&] { ASSERT_TRUE(Save(mNew)); });
     ASSERT_GE(count, 5); // made, written, flushed, closed, renamed
+    // The file is on the disk before it takes the name, and the folder after.
+    EXPECT_THAT(FileFaults::GetCalls(), ::testing::EndsWith(" fsync close rename open fsync close "));
     int failures = 0;
     for (Mode const mode : kFailing)
         for (int const error : kErrors)

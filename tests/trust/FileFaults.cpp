@@ -5,6 +5,7 @@
 #include <cstdarg>
 #include <cstddef>
 #include <fcntl.h>
+#include <string>
 #include <sys/stat.h>
 #include <sys/syscall.h>
 #include <unistd.h>
@@ -20,11 +21,13 @@ struct {
     int first = 0;
     int error = 0;
     int count = 0;
+    std::string calls;
 } sweep;
 
-bool Fails() {
+bool Fails(char const* call) {
     if (!sweep.isArmed) return false;
     int const ordinal = ++sweep.count;
+    sweep.calls.append(call).append(" ");
     bool const fails = (sweep.mode == FileFaults::Mode::Fail && ordinal == sweep.first) ||
                        (sweep.mode == FileFaults::Mode::FailAll && ordinal >= sweep.first);
     if (fails) errno = sweep.error;
@@ -47,12 +50,14 @@ bool IsAtEnd() {
 
 } // namespace
 
-void FileFaults::Arm(Mode mode, int k, int error) { sweep = {true, mode, k, error, 0}; }
+void FileFaults::Arm(Mode mode, int k, int error) { sweep = {true, mode, k, error, 0, {}}; }
 
 int FileFaults::Disarm() {
     sweep.isArmed = false;
     return sweep.count;
 }
+
+std::string const& FileFaults::GetCalls() { return sweep.calls; }
 
 } // namespace Moka::Testing
 
@@ -70,25 +75,27 @@ MOKA_INTERPOSED int open(char const* path, int flags, ...) {
     // NOLINTNEXTLINE(clang-analyzer-valist.Uninitialized): va_start did that
     unsigned const mode = (flags & O_CREAT) != 0 ? va_arg(arguments, unsigned) : 0;
     va_end(arguments);
-    if (Fails()) return -1;
+    if (Fails("open")) return -1;
     return static_cast<int>(syscall(SYS_openat, AT_FDCWD, path, flags, mode));
 }
 
 MOKA_INTERPOSED ssize_t write(int file, void const* data, std::size_t count) {
-    if (Fails() || IsInterrupted()) return -1;
+    if (Fails("write") || IsInterrupted()) return -1;
     return syscall(SYS_write, file, data, Cut(count));
 }
 
 MOKA_INTERPOSED ssize_t pread(int file, void* data, std::size_t count, off_t offset) {
-    if (Fails() || IsInterrupted()) return -1;
+    if (Fails("pread") || IsInterrupted()) return -1;
     return IsAtEnd() ? 0 : syscall(SYS_pread64, file, data, Cut(count), offset);
 }
 
-MOKA_INTERPOSED int fsync(int file) { return Fails() ? -1 : static_cast<int>(syscall(SYS_fsync, file)); }
+MOKA_INTERPOSED int fsync(int file) {
+    return Fails("fsync") ? -1 : static_cast<int>(syscall(SYS_fsync, file));
+}
 
 // A descriptor is gone whatever close says.
 MOKA_INTERPOSED int close(int file) {
-    bool const fails = Fails();
+    bool const fails = Fails("close");
     int const error = errno;
     int const closed = static_cast<int>(syscall(SYS_close, file));
     if (fails) errno = error;
@@ -96,13 +103,13 @@ MOKA_INTERPOSED int close(int file) {
 }
 
 MOKA_INTERPOSED int rename(char const* from, char const* to) noexcept {
-    return Fails() ? -1 : static_cast<int>(syscall(SYS_renameat2, AT_FDCWD, from, AT_FDCWD, to, 0));
+    return Fails("rename") ? -1 : static_cast<int>(syscall(SYS_renameat2, AT_FDCWD, from, AT_FDCWD, to, 0));
 }
 
 MOKA_INTERPOSED int fchmod(int file, mode_t mode) noexcept {
-    return Fails() ? -1 : static_cast<int>(syscall(SYS_fchmod, file, mode));
+    return Fails("fchmod") ? -1 : static_cast<int>(syscall(SYS_fchmod, file, mode));
 }
 
 MOKA_INTERPOSED off_t lseek(int file, off_t offset, int whence) noexcept {
-    return Fails() ? -1 : syscall(SYS_lseek, file, offset, whence);
+    return Fails("lseek") ? -1 : syscall(SYS_lseek, file, offset, whence);
 }

@@ -3,6 +3,8 @@
 // Thread: one.
 #pragma once
 
+#include <string>
+
 namespace Moka::Testing {
 
 class FileFaults {
@@ -17,6 +19,8 @@ public:
     static void Arm(Mode mode, int k, int error);
     // How many calls there were since.
     static int Disarm();
+    // Their names, in order: "open write fsync close ".
+    static std::string const& GetCalls();
 };
 
 } // namespace Moka::Testing

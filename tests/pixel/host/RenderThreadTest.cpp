@@ -92,8 +92,10 @@ TEST_F(RenderThreadTest, TurnsAwayASecondOneAndTheFirstGoesOnWithItsDefaultFrame
     ThreadPtr first = MustStart({{}, true, 64, 1});
     ASSERT_TRUE(first);
     std::string error;
-    EXPECT_EQ(RenderThread::Start({}, &error), nullptr);
-    EXPECT_THAT(error, HasSubstr("stop it first"));
+    for (int attempt = 0; attempt < 2; ++attempt) {
+        EXPECT_EQ(RenderThread::Start({}, &error), nullptr);
+        EXPECT_THAT(error, HasSubstr("stop it first"));
+    }
     EXPECT_EQ(RenderThread::Start({{}, false, 0, 16}, &error), nullptr);
     EXPECT_THAT(error, HasSubstr("0 x 16"));
 

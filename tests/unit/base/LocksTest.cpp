@@ -24,6 +24,8 @@ INSTANTIATE_TEST_SUITE_P(Kinds, LocksTest, testing::Bool(),
 TEST_P(LocksTest, WaitTimesOutWithTheLockHeldAgain) {
     int guarded = 0;
     std::thread other;
+    // The time runs out in the next second.
+    std::this_thread::sleep_until(std::chrono::ceil<std::chrono::seconds>(Clock::now()) - 15ms);
     {
         AutoCriticalSection const inside(lock);
         auto const start = Clock::now();

@@ -109,17 +109,31 @@ TEST(TaskMemoryTest, AThreadThatEndsLeavesItsBlocksToOthers) {
     EXPECT_LE(seen.size(), largest);
 }
 
+// As from a caller to the render thread, which lives on.
 TEST(TaskMemoryTest, AOneWayStreamReusesItsBlocks) {
     constexpr std::size_t kSize = 100;
+    constexpr int kRounds = 50;
     std::set<void*> seen;
-    for (int round = 0; round < 50; ++round) {
-        std::vector<void*> blocks;
+    std::vector<void*> blocks;
+    std::atomic<int> turn{0}; // odd: the other thread's
+    auto const await = [&turn](int wanted) {
+        while (turn != wanted) std::this_thread::yield();
+    };
+    std::thread consumer([&] {
+        for (int round = 0; round < kRounds; ++round) {
+            await(2 * round + 1);
+            for (void* const block : blocks) FreeTask(block, kSize);
+            ++turn;
+        }
+    });
+    for (int round = 0; round < kRounds; ++round) {
+        blocks.clear();
         for (int i = 0; i < 100; ++i) blocks.push_back(AllocateTask(kSize));
         seen.insert(blocks.begin(), blocks.end());
-        std::thread([&blocks] {
-            for (void* const block : blocks) FreeTask(block, kSize);
-        }).join();
+        ++turn;
+        await(2 * round + 2);
     }
+    consumer.join();
     EXPECT_LE(seen.size(), 300u);
 }
 #endif

@@ -156,10 +156,31 @@ TEST_F(TaskQueueTest, WaitingDoesNotAwaitWhatWasPostedAfter) {
     queue.Post(MakeTask([&] {
         inTime = waited.get_future().wait_for(std::chrono::seconds(30)) == std::future_status::ready;
     }));
+    std::thread later([&queue] { queue.WaitForTasks(); }); // for more than the first, which it must not delay
+    std::this_thread::sleep_for(std::chrono::milliseconds(50));
     first.Open();
     waiter.join();
+    later.join();
     queue.Stop();
     EXPECT_TRUE(inTime);
+}
+
+// What a task owns goes with it.
+struct SlowToGo {
+    ~SlowToGo() {
+        std::this_thread::sleep_for(std::chrono::milliseconds(20));
+        gone = true;
+    }
+    bool& gone;
+};
+
+TEST_F(TaskQueueTest, WaitingEndsWhenTheTaskIsFreed) {
+    QueueThread queue;
+    queue.Start();
+    bool gone = false;
+    queue.Post(MakeTask([owned = std::shared_ptr<SlowToGo>(new SlowToGo{gone})] {}));
+    queue.WaitForTasks();
+    EXPECT_TRUE(gone);
 }
 
 TEST_F(TaskQueueTest, GoesOnAfterAnExceptionAndAWaitInsideATask) {

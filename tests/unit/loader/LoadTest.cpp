@@ -142,6 +142,45 @@ TEST_F(Load, CancelAllDropsTheLoadsOfOneListenerAndNothingElse) {
     EXPECT_EQ(listener.GetEvents(), (Events{"pending", "save 9", "completed"}));
 }
 
+class CountingQueue final : public IGLMsgQueue {
+public:
+    explicit CountingQueue(IGLMsgQueue& queue) : mQueue(queue) {}
+    bool Post(ITask* task) override {
+        ++posted;
+        return mQueue.Post(task);
+    }
+    void WaitForTasks() override { mQueue.WaitForTasks(); }
+
+    std::atomic<int> posted{0};
+
+private:
+    IGLMsgQueue& mQueue;
+};
+
+// So whoever has cancelled may take the queue away.
+TEST_F(Load, NoUploadIsPostedAfterCancelHasReturned) {
+    String const path = WritePicture("tall.mki", 1, 500 * kMaxSide);
+    CountingQueue counting(*queue);
+    std::thread canceller;
+    int whenCancelled = 0;
+    int whenUploaded = 0;
+    listener.whenNoted = [&](std::string const& event) {
+        if (event != "pending") return;
+        canceller = std::thread([&] {
+            Loader().CancelAllLoadRequest(&listener);
+            whenCancelled = counting.posted;
+        });
+        std::this_thread::sleep_for(std::chrono::milliseconds(20)); // it waits for the loader by now
+    };
+    listener.whenLoaded = [&](Bitmap*, IMKBitmap*) { whenUploaded = counting.posted; };
+    Loader().RequestLoad(&listener, 1, path, BITMAP_TYPE_GRAPHICS, &counting, 0, 0);
+    listener.AwaitCompleted(1);
+    canceller.join();
+    queue->WaitForTasks(); // the strips post through the counting one until they are gone
+    EXPECT_GE(whenUploaded, 500);
+    EXPECT_GE(whenCancelled, whenUploaded);
+}
+
 TEST_F(Load, BrokenFilesAreErrorsAndTheLoopGoesOn) {
     WritePicture("cut.png", 30, 30);
     std::filesystem::resize_file(folder.Path("cut.png"),
