@@ -100,7 +100,7 @@ struct RenderThread::Impl {
     RenderThreadOptions const options;
     RenderContextInfo info;
     std::unique_ptr<detail::HostContext> context; // made and destroyed on the thread
-    std::promise<std::string> started;           // an error, or empty
+    std::promise<std::string> started;            // an error, or empty
     Thread thread;
 };
 

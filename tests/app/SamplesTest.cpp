@@ -1,6 +1,5 @@
-// What the demonstration relies on: its pictures keep to their borders, and its comparison sees every pixel.
+// The comparison of the demonstration sees every pixel.
 #include "apps/samples/Compare.h"
-#include "apps/samples/Picture.h"
 #include "tests/app/ToolTest.h"
 
 namespace Moka::Testing {
@@ -20,19 +19,6 @@ TEST_F(SamplesTest, ComparesEveryPixel) {
     EXPECT_EQ(Samples::Compare(Path("a.png"), Path("b.png")).differing, 2);
     EXPECT_FALSE(Samples::Compare(Path("a.png"), Path("turned.png")).isSameSize);
     EXPECT_FALSE(Samples::Compare(Path("a.png"), Path("none.png")).isRead);
-}
-
-TEST_F(SamplesTest, PaintsWithinTheBorders) {
-    Samples::Picture picture(4, 3);
-    for (int const y : {-1, 0, 1, 2, 3}) {
-        picture.Blend(-1, y, {1, 1, 1, 1}, 1);
-        picture.Blend(4, y, {1, 1, 1, 1}, 1);
-    }
-    picture.Blend(1, 1, {1, 0, 0, 0.5f}, 1);
-    ASSERT_TRUE(picture.Save(Path("out.mki"), 100));
-    TestImage expected(4, 3);
-    expected.SetColor(1, 1, {128, 0, 0, 128});
-    ExpectSamePixels(expected, "out.mki");
 }
 
 } // namespace

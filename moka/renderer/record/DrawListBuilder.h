@@ -34,8 +34,8 @@ public:
 
     // Draws count of the vertices, from the first one on, which lie in this list. state is compared with the
     // last draw's unless isKnownSame; the program's values are copied if they changed.
-    void AddDraw(RunState const& state, bool isKnownSame, ProgramState& program,
-                 ListVertices const& vertices, int first, int count);
+    void AddDraw(RunState const& state, bool isKnownSame, ProgramState& program, ListVertices const& vertices,
+                 int first, int count);
     void Add(ColorClear const& clear);
     void Add(DepthStencilClear const& clear);
     void Add(TextureClear const& clear);

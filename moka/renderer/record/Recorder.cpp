@@ -72,8 +72,7 @@ bool Recorder::Draw(GraphicsObject& object, int format, PrimitiveType primitive,
         Flush();
         mDevice->RestoreHost(HostState::All);
     }
-    RunState& state =
-        requested->Resolve(mActive ? mActive->GetRef() : GetCurrentTarget(), format, primitive);
+    RunState& state = requested->Resolve(mActive ? mActive->GetRef() : GetCurrentTarget(), format, primitive);
     if (state.target.texture != 0 && program->GetSamplerCount() > 0) SampleCopyOfTarget(state);
     // Only now: a flush on the way here takes vertices out of the list.
     list.AddDraw(state, !requested->IsChanged(), *program, object.PlaceVertices(), first, count);
