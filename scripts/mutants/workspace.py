@@ -24,7 +24,7 @@ ENTRIES = {
     "moka_drawable_shaders": ("tests/unit/drawable", ()),
     "moka_pixel_window_tests": ("tests/pixel/host", ("moka_pixel_window_tests",)),
     "moka_soak_gles": ("tests/trust", ("moka_soak_gles",)),
-    "moka_soak_recording": ("tests/trust", ("moka_soak_recording",)),
+    "moka_soak_tracing": ("tests/trust", ("moka_soak_tracing",)),
     "readme.Draw": ("tests/readme", ("moka_readme", "moka_readme_check")),
 }
 MEMORY_LIMIT = 16 << 30  # bytes of address space: a fault may allocate without end
