@@ -27,6 +27,7 @@ ENTRIES = {
     "moka_soak_tracing": ("tests/trust", ("moka_soak_tracing",)),
     "readme.Draw": ("tests/readme", ("moka_readme", "moka_readme_check")),
 }
+ANGLE = "angle:"  # before a program's name: on the second driver, as scripts/fetch-angle has brought it
 MEMORY_LIMIT = 16 << 30  # bytes of address space: a fault may allocate without end
 PATIENCE = 3  # times as long as without a fault, then a program hangs
 
@@ -115,13 +116,17 @@ class Workspace:
 
     # --- building
 
+    def has(self, program):
+        """False for what this machine cannot run: programs on ANGLE, where it was not fetched."""
+        return not program.startswith(ANGLE) or (self.root / "third_party/angle").is_dir()
+
     def entry_of(self, program):
         """None for a GoogleTest program."""
         return ENTRIES.get(program.partition(".")[0], ENTRIES.get(program))
 
     def targets_of(self, program):
         entry = self.entry_of(program)
-        return entry[1] if entry else (program,)
+        return entry[1] if entry else (program.removeprefix(ANGLE),)
 
     def build(self, preset, programs):
         """None, or the compiler's complaint."""
@@ -158,7 +163,8 @@ class Workspace:
         if entry := self.entry_of(program):
             return ["ctest", "--test-dir", str(build / entry[0]), "-R", "^" + re.escape(program), "--no-tests=error",
                     "--stop-on-failure", "--output-on-failure"], build
-        found = [path for path in build.glob(f"tests/**/{program}") if path.is_file()]
+        name = program.removeprefix(ANGLE)
+        found = [path for path in build.glob(f"tests/**/{name}") if path.is_file()]
         if not found:
             raise WorkspaceError(f"there is no test program '{program}'; see tests/mutants/programs")
         return [str(found[0]), "--gtest_brief=1", "--gtest_color=no", "--gtest_fail_fast"], found[0].parent
@@ -169,6 +175,9 @@ class Workspace:
         environment = dict(os.environ)
         environment["LSAN_OPTIONS"] = (f"suppressions={self.tree}/tests/support/driver-leaks.txt:"
                                        "print_suppressions=0")
+        if program.startswith(ANGLE):
+            angle = self.root / "third_party/angle"
+            environment |= {"LD_LIBRARY_PATH": str(angle), "VK_ICD_FILENAMES": str(angle / "vk_swiftshader_icd.json")}
         process = subprocess.Popen(command, cwd=folder, env=environment, stdin=subprocess.DEVNULL,
                                    stdout=subprocess.PIPE, stderr=subprocess.STDOUT, start_new_session=True,
                                    preexec_fn=_limit_memory if preset == "debug" else _limit_core)

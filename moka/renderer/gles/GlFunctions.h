@@ -55,8 +55,10 @@ private:
     char const* const mName;
 };
 
+// The name of a member cannot stand in parentheses. NOLINTBEGIN(bugprone-macro-parentheses)
 #define MOKA_GL_FUNCTION(Name)                                                                               \
     static constexpr GlFunction<decltype(&::gl##Name)> Name{&::gl##Name, "gl" #Name};
+// NOLINTEND(bugprone-macro-parentheses)
 
 #else
 

@@ -106,6 +106,20 @@ TEST_F(BlendTest, DarkenAndLightenSeeTheDestinationUnderEveryClipAndStrip) {
     }
 }
 
+// What their programs discard, inside a stroke and around a corner, keeps the destination in every mode.
+TEST_F(BlendTest, AReplacingStrokeLeavesWhatItEncloses) {
+    MKPaint paint = MakePaint(MKPaint::Src);
+    paint.SetColor(0.9f, 0.5f, 0.2f, 0.8f);
+    paint.SetStyle(MKPaint::Stroke);
+    paint.SetLineWidth(3);
+    ExpectLikeReference({MakeBackdrop(90, 60),
+                         [&](IMKCanvas& canvas, Scenes::SceneStage&) {
+                             canvas.DrawRoundRect(6, 6, 46, 50, 16, 12, &paint);
+                             canvas.DrawCircle(68, 28, 15, &paint);
+                         }},
+                        "replacing strokes");
+}
+
 TEST_F(BlendTest, ColoursBeyondTheirRangeAreCutOff) {
     MKPaint paint;
     paint.SetColor(2, -1, 0.5f, 1.5f);

@@ -73,6 +73,20 @@ TEST_P(DrawStateTest, EachTargetTestsTheStencilThatItHadThen) {
     EXPECT_EQ(Count().pooledRenderBuffers, 1);
 }
 
+TEST_P(DrawStateTest, AfterForeignGlADrawThatSetsNoBlendStateReplaces) {
+    target->Activate();
+    BlendStateDescriptor adding(true);
+    adding.SetColorEquation(BlendingFunction::Add, BlendingFactor::One, BlendingFactor::One);
+    adding.SetAlphaEquation(BlendingFunction::Add, BlendingFactor::One, BlendingFactor::One);
+    blend->SetDescriptor(adding);
+    blend->Apply();
+    Fill(kRed, 0, 0, 8, 8);
+    RendererFactory::InvalidateState();
+    Fill(kBlue, 0, 0, 4, 8);
+    target->Deactivate(false, false);
+    EXPECT_EQ(Read(), With(Filled(kRed), kBlue, 0, 0, 4, 8));
+}
+
 TEST_P(DrawStateTest, WithoutAnActiveTargetTheHostsFrameBufferIsDrawnInto) {
     RendererFactory::Flush();
     HostFrameBuffer const host(kSize, kSize);

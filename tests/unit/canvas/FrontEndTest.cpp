@@ -98,7 +98,7 @@ TEST_F(FrontEnd, SavedLevelsHoldMatrixAndClipCountOrThePreviousOnes) {
     canvas->Restore(1);
     EXPECT_EQ(x(), 2);
     EXPECT_FALSE(isClipped()) << "level 1 had the count of level 0";
-    canvas->Restore(-1);
+    canvas->Restore(-2);
     EXPECT_EQ(x(), 1);
     canvas->Restore(-1);
     EXPECT_EQ(x(), 1);
