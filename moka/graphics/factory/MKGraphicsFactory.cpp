@@ -31,7 +31,7 @@ IMKBitmap* MKGraphicsFactory::CreateBitmap(IGLMsgQueue* queue, Rect const& regio
     if (!detail::IsValidBitmap(queue, width, height)) return nullptr;
     Rect const clipped = region.Intersect(Rect(0, 0, width, height));
     if (clipped.IsEmpty()) return nullptr;
-    // useQueue decides who owns the pixels here, and the strips are always caller-side; relied upon.
+    // useQueue decides who owns the pixels here, and the strips are always caller-side. Hosts call it so.
     return new (std::nothrow) MKTextureBitmap(queue, clipped, width, height, pixels, useQueue == 0, false);
 }
 
@@ -47,7 +47,7 @@ IMKBitmap* MKGraphicsFactory::CreateBitmap(IGLMsgQueue* queue, String const* pat
                                            int useQueue) {
     std::unique_ptr<Bitmap> const decoded(detail::DecodeFile(path, width, height));
     if (!decoded) return nullptr;
-    // The buffer passes to the texture bitmap. A request refused below loses it; relied upon.
+    // The buffer passes to the texture bitmap. A request refused below loses it.
     decoded->SetDeleteBuffer(false);
     if (!detail::IsValidBitmap(queue, decoded->GetWidth(), decoded->GetHeight())) return nullptr;
     IMKBitmap* const bitmap = new (std::nothrow) MKTextureBitmap(
