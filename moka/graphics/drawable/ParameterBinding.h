@@ -71,8 +71,11 @@ public:
 
     // Throws NotSupportedException while unbound.
     ParameterBinding& operator=(Value const& value) {
-        if (!mHandle) detail::ThrowUnbound();
-        mHandle->Set(&value);
+        if (mHandle) {
+            mHandle->Set(&value);
+        } else {
+            detail::ThrowUnbound();
+        }
         return *this;
     }
 

@@ -8,7 +8,7 @@
 
 namespace Moka::detail {
 
-ProgramState::ProgramState(std::shared_ptr<Recorder> recorder, char const* vertexSource,
+ProgramState::ProgramState(std::shared_ptr<Recorder> const& recorder, char const* vertexSource,
                            char const* fragmentSource, char const* label)
     : mVertexSource(vertexSource ? vertexSource : ""),
       mFragmentSource(fragmentSource ? fragmentSource : ""),

@@ -18,8 +18,8 @@ class Recorder;
 class ProgramState {
 public:
     // Builds nothing without a recorder. Texts are copied.
-    ProgramState(std::shared_ptr<Recorder> recorder, char const* vertexSource, char const* fragmentSource,
-                 char const* label);
+    ProgramState(std::shared_ptr<Recorder> const& recorder, char const* vertexSource,
+                 char const* fragmentSource, char const* label);
 
     // Within a request: belongs to recorder from now on. False: released, or the driver made no program.
     bool BuildIn(std::shared_ptr<Recorder> const& recorder);
