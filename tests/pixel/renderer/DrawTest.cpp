@@ -155,8 +155,10 @@ TEST_P(DrawTest, AFullListIsPlayedAndALaterFrameAsksNothingAndGrowsNothing) {
     // Few draws fill it as well, when they have many vertices.
     std::vector<float> const many(200000);
     target->Activate();
-    quad->SetVertices(0, many.data(), 100000);
-    for (int i = 0; i < 4; ++i) EXPECT_TRUE(quad->Draw(0, -1, 1));
+    for (int i = 0; i < 4; ++i) {
+        quad->SetVertices(0, many.data(), 100000);
+        EXPECT_TRUE(quad->Draw(0, -1, 1));
+    }
     EXPECT_GT(Count().flushes, after.flushes);
     target->Deactivate(false, false);
 }
