@@ -61,7 +61,7 @@ Texel Photo(Place const& p) {
     int const dy = 2 * p.y + 1 - p.height * 6 / 10;
     int const radius = std::max(1, std::min(p.width, p.height) * 2 / 9);
     long long const inside = 1LL * radius * radius - 1LL * dx * dx - 1LL * dy * dy;
-    auto const part = static_cast<int>(std::clamp(inside + 2 * radius, 0LL, 4LL * radius));
+    auto const part = static_cast<int>(std::clamp(inside + 2LL * radius, 0LL, 4LL * radius));
     t = Mix(t, {255, 244, 200, 255}, part, 4 * radius);
     if (v > 1000 - Ridge(p.x + p.width / 5, p.width, 620, 380, 610)) t = {104, 112, 150, 255};
     if (v > 1000 - Ridge(p.x, p.width, 450, 270, 430)) t = {64, 88, 104, 255};
