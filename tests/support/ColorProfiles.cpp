@@ -129,7 +129,8 @@ FileBytes EmbedInJpeg(FileBytes const& file, FileBytes const& profile, std::size
 
 // The sides of a simple file stand in its one chunk, lossless.
 FileBytes EmbedInWebp(FileBytes const& file, FileBytes const& profile) {
-    unsigned const bits = file[21] | file[22] << 8 | file[23] << 16 | static_cast<unsigned>(file[24]) << 24;
+    auto const byte = [&file](std::size_t at) { return static_cast<unsigned>(file[at]); };
+    unsigned const bits = byte(21) | byte(22) << 8 | byte(23) << 16 | byte(24) << 24;
     FileBytes chunks = MakeWebpChunk("ICCP", profile);
     Append(chunks, FileBytes(file.begin() + 12, file.end()));
     return MakeWebpFile(kWebpProfileFlag | kWebpAlphaFlag, static_cast<int>(bits & 0x3FFF) + 1,
@@ -166,7 +167,8 @@ FileBytes PutBeforePixels(FileBytes const& png, FileBytes const& chunks) {
     FileBytes result(png.begin(), png.begin() + kPngHeader);
     Append(result, chunks);
     bool const hasMark = std::memcmp(png.data() + kPngHeader + 4, "sRGB", 4) == 0;
-    Append(result, FileBytes(png.begin() + kPngHeader + (hasMark ? kSrgbChunk : 0), png.end()));
+    auto const rest = static_cast<std::ptrdiff_t>(kPngHeader + (hasMark ? kSrgbChunk : 0));
+    Append(result, FileBytes(png.begin() + rest, png.end()));
     return result;
 }
 

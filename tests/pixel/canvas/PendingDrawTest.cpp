@@ -42,7 +42,8 @@ protected:
 
     static void Fill(Drawn const& drawn, Color const& color) {
         MKPaint paint;
-        paint.SetColor(color[0] / 255.0f, color[1] / 255.0f, color[2] / 255.0f);
+        auto const part = [&color](std::size_t i) { return static_cast<float>(color[i]) / 255.0f; };
+        paint.SetColor(part(0), part(1), part(2));
         drawn.canvas->DrawRect(0, 0, kSide, kSide, &paint);
     }
 
