@@ -121,7 +121,7 @@ TEST(Color, ADisplayP3ImageBecomesSrgbInEveryFormatAndAtEverySize) {
     for (auto const& [before, after] : known) {
         Bytes const file = Encode(Fill(16, before), "jpg");
         // In one part, and in several out of order.
-        for (std::size_t const part : {60000, 100}) {
+        for (std::size_t const part : {std::size_t{60000}, std::size_t{100}}) {
             Image const decoded = Decode(EmbedProfile(file, profile, part));
             EXPECT_LE(LargestDifference(decoded, Fill(16, after)), 2) << int{before[0]};
         }
