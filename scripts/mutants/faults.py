@@ -46,6 +46,8 @@ def _read_stanza(subject, place, lines):
             fields[last] = value.strip()
     if not old or not fields.get("file") or not fields.get("user"):
         raise ListError(f"{place}: '{name}' needs 'file:', 'user:' and the text to replace, '- text'")
+    if "preset" in fields and "tests" not in fields:
+        raise ListError(f"{place}: '{name}' needs 'tests:', because it has a preset")
     return Fault(name=f"{subject}/{name}", place=place, file=fields["file"], user=fields["user"],
                  old="\n".join(old), new="\n".join(new), preset=fields.get("preset", "debug"),
                  tests=fields.get("tests", ""), unnoticed=fields.get("unnoticed", ""))

@@ -101,6 +101,8 @@ class Workspace:
         command = ["cmake", "--preset", preset, "-DMOKA_BUILD_BENCHMARKS=OFF", "-DCMAKE_LINK_DEPENDS_NO_SHARED=ON",
                    "-DCMAKE_EXE_LINKER_FLAGS=-Wl,--strip-debug", "-DCMAKE_SHARED_LINKER_FLAGS=-Wl,--strip-debug"]
         self._run(command, environment)
+        listed = self._run(["ninja", "-C", str(self.build_folder(preset)), "-t", "targets", "all"])
+        self._targets = {line.partition(":")[0] for line in listed.splitlines()}
         self._compiled = {os.path.relpath(entry["file"], self.tree) for entry in
                           json.loads((self.build_folder(preset) / "compile_commands.json").read_text())}
 
@@ -109,6 +111,7 @@ class Workspace:
                               stderr=subprocess.STDOUT)
         if done.returncode != 0:
             raise WorkspaceError(f"'{' '.join(command)}' failed:\n{done.stdout.decode(errors='replace')[-3000:]}")
+        return done.stdout.decode(errors="replace")
 
     def is_compiled(self, fault):
         """False for a source that this machine leaves out of the build, for want of a JDK for instance."""
@@ -117,8 +120,10 @@ class Workspace:
     # --- building
 
     def has(self, program):
-        """False for what this machine cannot run: programs on ANGLE, where it was not fetched."""
-        return not program.startswith(ANGLE) or (self.root / "third_party/angle").is_dir()
+        """False for what this machine cannot run: without a JDK, or on ANGLE where that was not fetched."""
+        if program.startswith(ANGLE) and not (self.root / "third_party/angle").is_dir():
+            return False
+        return self._targets.issuperset(self.targets_of(program))
 
     def entry_of(self, program):
         """None for a GoogleTest program."""

@@ -18,7 +18,6 @@
 namespace Moka::Testing {
 namespace {
 
-using ::testing::AllOf;
 using ::testing::ElementsAre;
 using ::testing::HasSubstr;
 
@@ -92,7 +91,7 @@ Bytes MakeNumbers(char const* type, std::vector<double> const& values) {
     return MakePngChunk(type, content);
 }
 
-Bytes operator+(Bytes a, Bytes const& b) { return Insert(std::move(a), a.size(), b); }
+Bytes operator+(Bytes const& a, Bytes const& b) { return Insert(a, a.size(), b); }
 
 std::vector<double> const kSrgbPrimaries{0.3127, 0.3290, 0.64, 0.33, 0.30, 0.60, 0.15, 0.06};
 std::vector<double> const kAdobePrimaries{0.3127, 0.3290, 0.64, 0.33, 0.21, 0.71, 0.15, 0.06};
