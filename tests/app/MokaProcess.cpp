@@ -46,6 +46,8 @@ MokaProcess::~MokaProcess() {
 }
 
 void MokaProcess::RunChild(std::vector<std::string> const& arguments, ProcessOptions const& options) const {
+    // A shell's background job ignores it, and so would the program.
+    std::signal(SIGINT, SIG_DFL);
     std::vector<char*> argv{const_cast<char*>("moka")};
     for (std::string const& argument : arguments) argv.push_back(const_cast<char*>(argument.c_str()));
     argv.push_back(nullptr);
