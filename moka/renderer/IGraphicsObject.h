@@ -5,6 +5,8 @@
 // textures, vertices) is taken down when it is asked for; changing any of it afterwards does not reach it.
 #pragma once
 
+#include "moka/renderer/DrawBounds.h"
+
 namespace Moka {
 
 enum class PrimitiveType { TriangleList, TriangleStrip };
@@ -22,6 +24,10 @@ public:
     virtual bool Draw(int first, int count, int instances) = 0;
 
     virtual void Release() = 0;
+
+    // Encloses all that draws of the present vertices cover, whatever their program does. Lets them join earlier
+    // draws that they do not touch. Handing vertices over forgets it.
+    virtual void SetBounds(DrawBounds const&) {}
 
 protected:
     ~IGraphicsObject() = default;

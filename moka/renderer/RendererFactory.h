@@ -26,7 +26,8 @@ class ITextureObject;
 
 // Lowers what the device offers, so that the cutting of tall images can be seen with small ones.
 struct RendererLimits {
-    int maxTextureSize = 0; // texels; 0 keeps the device's own
+    int maxTextureSize = 0;  // texels; 0 keeps the device's own
+    bool mergesDraws = true; // false: only draws of equal state and values become one draw call
 };
 
 // How the context's owner looks up entry points by name (eglGetProcAddress has this type).

@@ -3,9 +3,25 @@
 // found a leak.
 #pragma once
 
+#include <array>
 #include <cstdint>
 
 namespace Moka {
+
+// Why a draw could not join the run of draws before it. Runs of one state become one draw call each.
+enum class RunEnd {
+    Program,
+    Texture, // or its sampling
+    Blend,
+    Scissor,
+    Clip, // or another depth-stencil state
+    Target,
+    Primitive, // or the layout of the vertices; a strip is always a run of its own
+    Values,    // integers that the run has as constants, or vertices that are too many to be moved together
+    Full,      // the list, or a block of values
+    Other,     // a clear, a copy or a flush lies between
+};
+inline constexpr std::size_t kRunEnds = 10;
 
 struct RendererStatistics {
     int textures = 0; // storages, not views
@@ -17,15 +33,19 @@ struct RendererStatistics {
     int textureObjects = 0;
     int depthStencilBuffers = 0;
     int programs = 0;
+    int variants = 0; // of programs, which draw runs whose uniform values differ
     int graphicsObjects = 0;
     int stateObjects = 0; // blend and depth-stencil states
     int buffers = 0;      // vertex buffers and vertex arrays of the context's own, kept until it is detached
 
-    // What was asked for, and what of it reached the driver.
+    // Draws that were requested, the runs that they were joined to, and the draw calls that the driver got.
     std::uint64_t drawRequests = 0;
+    std::uint64_t runs = 0;
     std::uint64_t draws = 0;
-    std::uint64_t flushes = 0;   // of the draw list
-    std::uint64_t listBytes = 0; // memory that the draw list holds
+    std::uint64_t records = 0;                     // sets of uniform values in the runs
+    std::array<std::uint64_t, kRunEnds> runEnds{}; // by RunEnd
+    std::uint64_t flushes = 0;                     // of the draw list
+    std::uint64_t listBytes = 0;                   // memory that the draw list holds
 
     // Calls that change what the driver has.
     std::uint64_t frameBufferSwitches = 0;

@@ -14,8 +14,8 @@ namespace Moka::Testing {
 // How far each pixel of an image may be off, in steps of any channel. 255 is anything.
 class Slack {
 public:
-    Slack(int width, int height)
-        : mWidth(width), mSteps(static_cast<std::size_t>(width) * static_cast<std::size_t>(height)) {}
+    Slack(int width, int height, unsigned char steps = 0)
+        : mWidth(width), mSteps(static_cast<std::size_t>(width) * static_cast<std::size_t>(height), steps) {}
 
     int Get(int x, int y) const { return mSteps[GetIndex(x, y)]; }
     void Set(int x, int y, int steps) {

@@ -7,6 +7,9 @@
 
 #include "moka/base/Rect.h"
 
+#include <algorithm>
+#include <cmath>
+
 namespace Moka::detail {
 
 // As the programs' vertex stages declare them; not initialised, because arrays of them are filled at once.
@@ -47,6 +50,13 @@ struct Corners {
 
 inline RectF Grown(RectF const& r, float by) {
     return {r.left - by, r.top - by, r.right + by, r.bottom + by};
+}
+
+// The sides in order, and so far outside of them.
+inline RectF Hull(RectF const& r, float reach) {
+    return Grown({std::min(r.left, r.right), std::min(r.top, r.bottom), std::max(r.left, r.right),
+                  std::max(r.top, r.bottom)},
+                 std::fabs(reach));
 }
 
 inline Corners<CoverageVertex> CoverageCorners(Outline const& o) {

@@ -7,8 +7,10 @@
 #include "moka/graphics/drawable/Drawing.h"
 #include "moka/graphics/drawable/FringeGeometry.h"
 #include "moka/graphics/drawable/MKGraphicsUtil.h"
+#include "moka/graphics/drawable/ProjectedBounds.h"
 #include "moka/renderer/ITextureObject.h"
 
+#include <algorithm>
 #include <climits>
 #include <memory>
 #include <new>
@@ -84,6 +86,7 @@ bool MKBitmapDrawable::DrawBitmapRT(IMKBitmapReadable* bitmap, RectF const& bitm
     TexturedVertex const* const end =
         WriteTextured(vertices, dst, TextureCoordinates(bitmapBounds, src), paint.IsAntiAliasing());
     mGraphics->SetVertices(0, vertices, static_cast<int>(end - vertices));
+    mGraphics->SetBounds(Project(Hull(dst, 0.5f), projection));
     return DrawVertices(bitmap, targetBounds, kCopyTag, projection, paint);
 }
 
@@ -99,8 +102,15 @@ bool MKBitmapDrawable::DrawBitmapsRT(IMKBitmapReadable* bitmap, RectF const& bit
     if (!vertices) return false;
     RectF const uv = TextureCoordinates(bitmapBounds, src);
     TexturedVertex* end = vertices.get();
-    for (RectF const& dst : *dsts) end = WriteTextured(end, dst, uv, antiAliased);
+    RectF hull = dsts->empty() ? RectF() : Hull(dsts->front(), 0.5f);
+    for (RectF const& dst : *dsts) {
+        end = WriteTextured(end, dst, uv, antiAliased);
+        RectF const box = Hull(dst, 0.5f);
+        hull = {std::min(hull.left, box.left), std::min(hull.top, box.top), std::max(hull.right, box.right),
+                std::max(hull.bottom, box.bottom)};
+    }
     mGraphics->SetVertices(0, vertices.get(), static_cast<int>(count));
+    mGraphics->SetBounds(Project(hull, projection));
     vertices.reset();
     return DrawVertices(bitmap, targetBounds, kBatchCopyTag, projection, paint);
 }

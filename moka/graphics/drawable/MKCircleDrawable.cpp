@@ -2,6 +2,7 @@
 
 #include "moka/graphics/drawable/Drawing.h"
 #include "moka/graphics/drawable/FringeGeometry.h"
+#include "moka/graphics/drawable/ProjectedBounds.h"
 
 namespace Moka {
 
@@ -30,6 +31,7 @@ void MKCircleDrawable::DrawCircleRT(PointF const& center, float radius, Matrix4<
               {box.right, box.bottom});
 
     mGraphics->SetVertices(0, vertices, kQuadVertices);
+    mGraphics->SetBounds(Project(box, projection));
     mState.Apply(paint.GetXFermode());
     UseShader(*mShader, projection, paint);
     mShader->uCenter = Vector2<float>(center.x, center.y);

@@ -2,7 +2,9 @@
 
 #include "moka/graphics/drawable/Drawing.h"
 #include "moka/graphics/drawable/FringeGeometry.h"
+#include "moka/graphics/drawable/ProjectedBounds.h"
 
+#include <algorithm>
 #include <climits>
 #include <cmath>
 #include <memory>
@@ -31,6 +33,13 @@ float Distance(PointF const& a, PointF const& b) {
     float const x = b.x - a.x;
     float const y = b.y - a.y;
     return std::sqrt(x * x + y * y);
+}
+
+void Include(RectF& hull, PointF const& point) {
+    hull.left = std::min(hull.left, point.x);
+    hull.top = std::min(hull.top, point.y);
+    hull.right = std::max(hull.right, point.x);
+    hull.bottom = std::max(hull.bottom, point.y);
 }
 
 void WriteLine(LineVertex* at, PointF const& start, PointF const& end, float length, float reach) {
@@ -124,6 +133,10 @@ void MKLineDrawable::DrawLineRT(PointF const& start, PointF const& end, Matrix4<
     WriteLine(vertices, start, end, length, width * 0.5f + 0.5f);
 
     mLineGraphics->SetVertices(0, vertices, kQuadVertices);
+    // A corner lies so far from the end along the line and as far across it.
+    constexpr float kDiagonal = 1.4143f;
+    float const reach = (width * 0.5f + 0.5f) * kDiagonal;
+    mLineGraphics->SetBounds(Project(Hull({start.x, start.y, end.x, end.y}, reach), projection));
     mState.Apply(paint.GetXFermode());
     UseShader(*mLineShader, projection, paint);
     mLineShader->uLineInfo = Vector2<float>(width * 0.5f, length);
@@ -138,7 +151,7 @@ void MKLineDrawable::DrawSimpleLineRT(PointF const& start, PointF const& end,
     CoverageVertex vertices[kMostSegmentVertices];
     SegmentWriter const writer(paint);
     writer.Write(vertices, start, end);
-    DrawSimpleVertices(vertices, writer.CountVertices(), projection, paint);
+    DrawSimpleVertices(vertices, writer.CountVertices(), {start.x, start.y, end.x, end.y}, projection, paint);
 }
 
 void MKLineDrawable::DrawSimpleLinesRT(std::vector<PointF>* points, Matrix4<float> const& projection,
@@ -154,15 +167,24 @@ void MKLineDrawable::DrawSimpleLinesRT(std::vector<PointF>* points, Matrix4<floa
                                                          CoverageVertex[static_cast<std::size_t>(count)]);
     if (!vertices) return;
     CoverageVertex* end = vertices.get();
-    for (std::size_t i = 0; i < segments; ++i)
-        end = writer.Write(end, (*points)[2 * i], (*points)[2 * i + 1]);
-    DrawSimpleVertices(vertices.get(), count, projection, paint);
+    RectF hull;
+    for (std::size_t i = 0; i < segments; ++i) {
+        PointF const& from = (*points)[2 * i];
+        PointF const& to = (*points)[2 * i + 1];
+        end = writer.Write(end, from, to);
+        if (i == 0) hull = {from.x, from.y, from.x, from.y};
+        Include(hull, from);
+        Include(hull, to);
+    }
+    DrawSimpleVertices(vertices.get(), count, hull, projection, paint);
 }
 
-void MKLineDrawable::DrawSimpleVertices(void const* vertices, int count, Matrix4<float> const& projection,
-                                        MKPaint const& paint) {
+void MKLineDrawable::DrawSimpleVertices(void const* vertices, int count, RectF const& points,
+                                        Matrix4<float> const& projection, MKPaint const& paint) {
     if (!mSimpleGraphics || !mState || !mRectShader) return;
     mSimpleGraphics->SetVertices(0, vertices, count);
+    float const reach = paint.GetLineWidth() * 0.5f + 0.5f;
+    mSimpleGraphics->SetBounds(Project(Hull(points, reach), projection));
     mState.Apply(paint.GetXFermode());
     UseShader(*mRectShader, projection, paint);
     DrawAll(*mSimpleGraphics);

@@ -42,8 +42,9 @@ public:
                            MKPaint const& paint);
 
 private:
-    void DrawSimpleVertices(void const* vertices, int count, Matrix4<float> const& projection,
-                            MKPaint const& paint);
+    // points encloses the lines' ends.
+    void DrawSimpleVertices(void const* vertices, int count, RectF const& points,
+                            Matrix4<float> const& projection, MKPaint const& paint);
 
     detail::RendererPtr<IGraphicsObject> mLineGraphics;
     detail::RendererPtr<IGraphicsObject> mSimpleGraphics;

@@ -2,6 +2,7 @@
 
 #include "moka/graphics/drawable/Drawing.h"
 #include "moka/graphics/drawable/FringeGeometry.h"
+#include "moka/graphics/drawable/ProjectedBounds.h"
 
 namespace Moka {
 
@@ -28,6 +29,8 @@ bool MKRectDrawable::DrawRectRT(RectF const& rect, Matrix4<float> const& project
         end = WriteStroke(end, rect, paint.GetLineWidth() * 0.5f, antiAliased);
 
     mGraphics->SetVertices(0, vertices, static_cast<int>(end - vertices));
+    float const reach = IsStroked(style) ? paint.GetLineWidth() * 0.5f + 0.5f : 0.5f;
+    mGraphics->SetBounds(Project(Hull(rect, reach), projection));
     mState.Apply(paint.GetXFermode());
     UseShader(*mShader, projection, paint);
     return DrawAll(*mGraphics);

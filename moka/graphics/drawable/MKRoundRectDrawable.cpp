@@ -2,6 +2,7 @@
 
 #include "moka/graphics/drawable/Drawing.h"
 #include "moka/graphics/drawable/FringeGeometry.h"
+#include "moka/graphics/drawable/ProjectedBounds.h"
 
 #include <algorithm>
 
@@ -17,6 +18,14 @@ struct MKRoundRectDrawable::Shape {
           rx(std::min(r.GetWidth() * 0.5f, wantedRx)),
           ry(std::min(r.GetHeight() * 0.5f, wantedRy)),
           straight(r.left + rx, r.top + ry, r.right - rx, r.bottom - ry) {}
+
+    // With negative radii the corners' centres lie outside.
+    RectF GetHull(float reach) const {
+        RectF const hull = Hull(rect, reach);
+        RectF const centers = Hull(straight, reach);
+        return {std::min(hull.left, centers.left), std::min(hull.top, centers.top),
+                std::max(hull.right, centers.right), std::max(hull.bottom, centers.bottom)};
+    }
 
     RectF rect;
     float rx;
@@ -120,7 +129,7 @@ bool MKRoundRectDrawable::DrawFill(Shape const& shape, Matrix4<float> const& pro
                                    MKPaint const& paint) {
     CoverageVertex vertices[kFillVertices];
     WriteFillBody(vertices, shape.rect, shape.straight);
-    DrawBody(vertices, kFillVertices, projection, paint);
+    DrawBody(vertices, kFillVertices, shape.GetHull(0.5f), projection, paint);
     return DrawCorners(shape, 0.5f, true, projection, paint);
 }
 
@@ -129,13 +138,14 @@ bool MKRoundRectDrawable::DrawStroke(Shape const& shape, Matrix4<float> const& p
     float const halfWidth = paint.GetLineWidth() * 0.5f;
     CoverageVertex vertices[kStrokeVertices];
     WriteStrokeBody(vertices, shape.rect, shape.straight, halfWidth);
-    DrawBody(vertices, kStrokeVertices, projection, paint);
+    DrawBody(vertices, kStrokeVertices, shape.GetHull(halfWidth + 0.5f), projection, paint);
     return DrawCorners(shape, halfWidth + 0.5f, false, projection, paint);
 }
 
-void MKRoundRectDrawable::DrawBody(void const* vertices, int count, Matrix4<float> const& projection,
-                                   MKPaint const& paint) {
+void MKRoundRectDrawable::DrawBody(void const* vertices, int count, RectF const& hull,
+                                   Matrix4<float> const& projection, MKPaint const& paint) {
     mBodyGraphics->SetVertices(0, vertices, count);
+    mBodyGraphics->SetBounds(Project(hull, projection));
     UseShader(*mBodyShader, projection, paint);
     DrawAll(*mBodyGraphics);
 }
@@ -145,6 +155,7 @@ bool MKRoundRectDrawable::DrawCorners(Shape const& shape, float reach, bool fill
     CornerVertex vertices[kCornersVertices];
     WriteCorners(vertices, Grown(shape.rect, reach), shape.straight);
     mCornerGraphics->SetVertices(0, vertices, kCornersVertices);
+    mCornerGraphics->SetBounds(Project(shape.GetHull(reach), projection));
     UseShader(*mCornerShader, projection, paint);
     mCornerShader->uIsFill = fill ? 1 : 0;
     mCornerShader->uStrokeWidth = paint.GetLineWidth();

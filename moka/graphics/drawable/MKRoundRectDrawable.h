@@ -35,7 +35,8 @@ private:
 
     bool DrawFill(Shape const& shape, Matrix4<float> const& projection, MKPaint const& paint);
     bool DrawStroke(Shape const& shape, Matrix4<float> const& projection, MKPaint const& paint);
-    void DrawBody(void const* vertices, int count, Matrix4<float> const& projection, MKPaint const& paint);
+    void DrawBody(void const* vertices, int count, RectF const& hull, Matrix4<float> const& projection,
+                  MKPaint const& paint);
     bool DrawCorners(Shape const& shape, float reach, bool fill, Matrix4<float> const& projection,
                      MKPaint const& paint);
 

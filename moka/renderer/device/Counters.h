@@ -5,6 +5,8 @@
 
 #include "moka/renderer/RendererStatistics.h"
 
+#include <algorithm>
+#include <array>
 #include <atomic>
 
 namespace Moka::detail {
@@ -32,12 +34,16 @@ struct Counters {
     std::atomic<int> textureObjects{0};
     std::atomic<int> depthStencilBuffers{0};
     std::atomic<int> programs{0};
+    std::atomic<int> variants{0};
     std::atomic<int> graphicsObjects{0};
     std::atomic<int> stateObjects{0};
     std::atomic<int> buffers{0};
 
     Counter drawRequests;
+    Counter runs;
     Counter draws;
+    Counter records;
+    std::array<Counter, kRunEnds> runEnds;
     Counter flushes;
     Counter listBytes;
 
@@ -69,11 +75,15 @@ struct Counters {
         result.textureObjects = textureObjects;
         result.depthStencilBuffers = depthStencilBuffers;
         result.programs = programs;
+        result.variants = variants;
         result.graphicsObjects = graphicsObjects;
         result.stateObjects = stateObjects;
         result.buffers = buffers;
         result.drawRequests = drawRequests;
+        result.runs = runs;
         result.draws = draws;
+        result.records = records;
+        std::copy(runEnds.begin(), runEnds.end(), result.runEnds.begin());
         result.flushes = flushes;
         result.listBytes = listBytes;
         result.frameBufferSwitches = frameBufferSwitches;

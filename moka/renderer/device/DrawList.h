@@ -4,17 +4,27 @@
 
 #include "moka/renderer/device/RunState.h"
 
+#include <cstdint>
 #include <variant>
 #include <vector>
 
 namespace Moka::detail {
 
-// Adjacent draws with one state and one set of uniform values: one draw call.
+// Vertices that are drawn with one set of uniform values.
+struct Record {
+    std::size_t values; // offset of the program's values into the list's uniforms, bytes
+    int first;          // vertex, counted in vertices of the run's own format
+    int count;          // vertices
+};
+
+// Draws with one state. A device that can take each record's values from a block of uniforms draws them with
+// one call for each full block; else each record is a draw call of its own.
 struct Run {
-    std::size_t state;    // index into the list's states
-    std::size_t uniforms; // offset of the program's values into the list's uniforms, bytes
-    int first;            // vertex, counted in vertices of the run's own format
-    int count;            // vertices
+    std::size_t state;       // index into the list's states
+    std::size_t firstRecord; // index into the list's records
+    std::size_t recordCount;
+    bool isContiguous;     // each record's vertices follow the last one's
+    std::uint32_t varying; // a bit for each int or bool, in the order of their offsets: set if records differ
 };
 
 // Ignores blending and the colour mask. So does DepthStencilClear with the write masks.
@@ -66,6 +76,7 @@ using Command =
 struct DrawList {
     std::vector<Command> commands;
     std::vector<RunState> states;
+    std::vector<Record> records;
     std::vector<unsigned char> uniforms;
     std::vector<float> vertices;
 };

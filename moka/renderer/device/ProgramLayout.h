@@ -1,6 +1,6 @@
 // ProgramLayout: the uniforms of a linked program and where each value lies in the program's block of values.
-// Values lie in the order of the layout, packed: a bool, an int and a texture unit are 4 bytes, vectors and
-// matrices their floats.
+// Values are packed in the order matrices, vec4, vec2, floats, integers, texture units; a bool, an int and a
+// texture unit are 4 bytes. Up to the texture units that is how std140 lays out a structure with these fields.
 #pragma once
 
 #include "moka/renderer/IParameterBinding.h"
@@ -44,6 +44,8 @@ struct ProgramLayout {
     std::vector<Uniform> uniforms;
     std::vector<std::size_t> samplers; // indices of uniforms, at most kMaxSamplers
     std::size_t size = 0;              // bytes of all values
+    std::size_t integersBegin = 0;     // bytes; ints and bools lie from here
+    std::size_t integersEnd = 0;       // to here, where the texture units begin
 
     bool HasRoomFor(BindingType type) const {
         return type != BindingTypeTextureUnit || samplers.size() < kMaxSamplers;
@@ -51,8 +53,32 @@ struct ProgramLayout {
 
     void Add(char const* name, BindingType type) {
         if (type == BindingTypeTextureUnit) samplers.push_back(uniforms.size());
-        uniforms.push_back({name, type, size, GetValueSize(type)});
-        size += uniforms.back().size;
+        uniforms.push_back({name, type, 0, GetValueSize(type)});
+        Place();
+    }
+
+private:
+    static bool IsInteger(BindingType type) { return type == BindingTypeInt || type == BindingTypeBool; }
+
+    template <class Belongs>
+    void PlaceThose(Belongs const& belongs) {
+        for (Uniform& uniform : uniforms) {
+            if (!belongs(uniform)) continue;
+            uniform.offset = size;
+            size += uniform.size;
+        }
+    }
+
+    void Place() {
+        size = 0;
+        for (BindingType const type :
+             {BindingTypeMatrix4, BindingTypeVector4, BindingTypeVector2, BindingTypeFloat}) {
+            PlaceThose([=](Uniform const& uniform) { return uniform.type == type; });
+        }
+        integersBegin = size;
+        PlaceThose([](Uniform const& uniform) { return IsInteger(uniform.type); });
+        integersEnd = size;
+        PlaceThose([](Uniform const& uniform) { return uniform.type == BindingTypeTextureUnit; });
     }
 };
 

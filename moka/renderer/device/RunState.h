@@ -84,8 +84,8 @@ struct RunState {
     }
 
     friend bool operator==(RunState const& a, RunState const& b) {
-        return a.target == b.target && a.scissor == b.scissor && a.blend == b.blend &&
-               a.depthStencil == b.depthStencil && a.program == b.program && a.textures == b.textures &&
+        return a.program == b.program && a.target == b.target && a.scissor == b.scissor &&
+               a.blend == b.blend && a.depthStencil == b.depthStencil && a.textures == b.textures &&
                a.format == b.format && a.primitive == b.primitive;
     }
 };

@@ -41,6 +41,7 @@ GlDevice::GlDevice(RendererProcLoader loader, Counters& countersOfContext)
 }
 
 GlDevice::~GlDevice() {
+    mergedRuns.Clear();
     vertexFormats.Clear();
     samplers.Clear();
     debug.Detach();
@@ -110,7 +111,7 @@ DeviceName GlDevice::CreateProgram(char const* vertexSource, char const* fragmen
     if (!layout->draws) ++counters.errors;
     if (name == 0) return 0;
     debug.Label(GL_PROGRAM_KHR, name, label);
-    programs.Add(name, label, layout);
+    programs.Add(name, {vertexSource, fragmentSource}, label, layout);
     return name;
 }
 

@@ -6,6 +6,7 @@
 #include "moka/renderer/gles/GlDebug.h"
 #include "moka/renderer/gles/GlFrameBuffers.h"
 #include "moka/renderer/gles/GlHostState.h"
+#include "moka/renderer/gles/GlMergedRuns.h"
 #include "moka/renderer/gles/GlPrograms.h"
 #include "moka/renderer/gles/GlSamplers.h"
 #include "moka/renderer/gles/GlState.h"
@@ -52,9 +53,10 @@ public:
     GlDebug debug;
     GlHostState host{state};
     GlFrameBuffers frameBuffers{state, host, debug};
-    GlPrograms programs{state};
+    GlPrograms programs{state, debug};
     GlSamplers samplers{state};
     GlVertexFormats vertexFormats{state};
+    GlMergedRuns mergedRuns{*this};
 
 private:
     GlSubmitter mSubmitter{*this};

@@ -7,7 +7,7 @@
 
 // clang-format off
 #define MOKA_GL_FUNCTIONS(X) \
-    X(ActiveTexture) X(AttachShader) X(BindAttribLocation) X(BindBuffer) X(BindFramebuffer) \
+    X(ActiveTexture) X(AttachShader) X(BindAttribLocation) X(BindBuffer) X(BindBufferRange) X(BindFramebuffer) \
     X(BindRenderbuffer) X(BindSampler) X(BindTexture) X(BindVertexArray) X(BlendEquation) \
     X(BlendFuncSeparate) X(BlitFramebuffer) X(BufferData) X(CheckFramebufferStatus) X(ClearBufferfi) \
     X(ClearBufferfv) X(ClearBufferiv) X(ColorMask) X(CompileShader) X(CopyTexSubImage2D) \
@@ -17,11 +17,11 @@
     X(EnableVertexAttribArray) X(Finish) X(FramebufferRenderbuffer) X(FramebufferTexture2D) \
     X(GenBuffers) X(GenFramebuffers) X(GenRenderbuffers) X(GenSamplers) X(GenTextures) \
     X(GenVertexArrays) X(GetActiveUniform) X(GetBooleanv) X(GetIntegerv) X(GetProgramInfoLog) \
-    X(GetProgramiv) X(GetShaderInfoLog) X(GetShaderiv) X(GetString) X(GetStringi) X(GetUniformLocation) \
+    X(GetProgramiv) X(GetShaderInfoLog) X(GetShaderiv) X(GetString) X(GetStringi) X(GetUniformBlockIndex) X(GetUniformLocation) \
     X(InvalidateFramebuffer) X(IsEnabled) X(LinkProgram) X(PixelStorei) X(ReadPixels) \
     X(RenderbufferStorage) X(SamplerParameteri) X(Scissor) X(ShaderSource) X(StencilFunc) X(StencilMask) \
-    X(StencilMaskSeparate) X(StencilOp) X(TexParameteri) X(TexStorage2D) X(TexSubImage2D) X(Uniform1fv) \
-    X(Uniform1iv) X(Uniform2fv) X(Uniform4fv) X(UniformMatrix4fv) X(UseProgram) X(VertexAttribPointer) \
+    X(StencilMaskSeparate) X(StencilOp) X(TexParameteri) X(TexStorage2D) X(TexSubImage2D) X(Uniform1fv) X(UniformBlockBinding) \
+    X(Uniform1iv) X(Uniform2fv) X(Uniform4fv) X(UniformMatrix4fv) X(UseProgram) X(VertexAttribIPointer) X(VertexAttribPointer) \
     X(Viewport)
 // clang-format on
 

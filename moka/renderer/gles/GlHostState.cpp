@@ -40,6 +40,8 @@ void GlHostState::SaveVertexInput() {
     Save(mState.arrayBuffer, mArrayBuffer);
 }
 
+void GlHostState::SaveUniformBuffer() { Save(mState.uniformBuffer, mUniformBuffer); }
+
 GLuint GlHostState::GetFrameBuffer() {
     return mFrameBuffers ? mFrameBuffers->draw : mState.frameBuffers.Get().draw;
 }
@@ -53,6 +55,7 @@ void GlHostState::RestoreFrameBuffers() {
 void GlHostState::RestoreVertexInput() {
     Restore(mState.vertexArray, mVertexArray);
     Restore(mState.arrayBuffer, mArrayBuffer);
+    Restore(mState.uniformBuffer, mUniformBuffer);
 }
 
 void GlHostState::RestoreAll() {

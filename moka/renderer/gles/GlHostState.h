@@ -21,6 +21,8 @@ public:
     void BindTarget(GLuint frameBuffer, GLsizei width, GLsizei height);
     // Vertex array and buffer may be changed afterwards.
     void SaveVertexInput();
+    // The general binding of uniform buffers may be changed afterwards.
+    void SaveUniformBuffer();
 
     // The frame buffer that the host draws into.
     GLuint GetFrameBuffer();
@@ -38,6 +40,7 @@ private:
     std::optional<unsigned> mObstacles;
     std::optional<GLuint> mVertexArray;
     std::optional<GLuint> mArrayBuffer;
+    std::optional<GLuint> mUniformBuffer;
 };
 
 } // namespace Moka::detail

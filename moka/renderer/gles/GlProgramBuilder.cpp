@@ -75,8 +75,10 @@ std::string GetProgramLog(GLuint program) {
     });
 }
 
-// 0, with failure set, when one of the three steps fails.
-GLuint Link(char const* vertexSource, char const* fragmentSource, std::string* failure) {
+} // namespace
+
+GLuint LinkGlProgram(char const* vertexSource, char const* fragmentSource, char const* attributeSource,
+                     std::string* failure) {
     ShaderStage const vertex(GL_VERTEX_SHADER, vertexSource);
     ShaderStage const fragment(GL_FRAGMENT_SHADER, fragmentSource);
     for (auto const& [stage, what] : {std::pair(&vertex, "vertex"), std::pair(&fragment, "fragment")}) {
@@ -87,7 +89,7 @@ GLuint Link(char const* vertexSource, char const* fragmentSource, std::string* f
     GLuint const program = Gl::CreateProgram();
     Gl::AttachShader(program, vertex.GetName());
     Gl::AttachShader(program, fragment.GetName());
-    BindAttributes(program, vertexSource);
+    BindAttributes(program, attributeSource);
     Gl::LinkProgram(program);
     Gl::DetachShader(program, vertex.GetName());
     Gl::DetachShader(program, fragment.GetName());
@@ -99,16 +101,14 @@ GLuint Link(char const* vertexSource, char const* fragmentSource, std::string* f
     return 0;
 }
 
-} // namespace
-
 GLuint BuildGlProgram(char const* vertexSource, char const* fragmentSource, char const* label, bool* draws) {
     std::string failure;
-    GLuint const program = Link(vertexSource, fragmentSource, &failure);
+    GLuint const program = LinkGlProgram(vertexSource, fragmentSource, vertexSource, &failure);
     *draws = program != 0;
     if (*draws) return program;
     __android_log_print(ANDROID_LOG_ERROR, "mok_log",
                         "RendererFactory::CreateShaderProgram: %s draws nothing: %s", label, failure.c_str());
-    return Link(kVertexOutside, kFragmentNever, &failure);
+    return LinkGlProgram(kVertexOutside, kFragmentNever, kVertexOutside, &failure);
 }
 
 } // namespace Moka::detail

@@ -6,10 +6,11 @@
 #include "moka/renderer/gles/GlTables.h"
 
 #include <cstring>
+#include <utility>
 
 namespace Moka::detail {
 
-void GlPrograms::Add(GLuint name, char const* label, ProgramLayout* layout) {
+void GlPrograms::Add(GLuint name, GlslStages sources, char const* label, ProgramLayout* layout) {
     Program& program = mPrograms[name];
     program.layout.draws = layout->draws;
     GLint count = 0;
@@ -19,6 +20,9 @@ void GlPrograms::Add(GLuint name, char const* label, ProgramLayout* layout) {
     }
     program.sent.resize(program.layout.size); // linking sets every uniform to zero
     *layout = program.layout;
+    if (!layout->draws) return;
+    program.variants =
+        std::make_unique<GlVariants>(mState, mDebug, label, std::move(sources), program.layout);
 }
 
 void GlPrograms::AddUniform(GLuint name, GLuint index, char const* label, Program& program) {
@@ -49,15 +53,25 @@ void GlPrograms::Delete(GLuint name) {
 
 void GlPrograms::Apply(GLuint name, unsigned char const* values) {
     if (mState.program.Set(name)) ++mState.counters.programSwitches;
+    Program* const found = Find(name);
+    if (!found || found->sent.empty()) return;
+    Program& program = *found;
+    if (std::memcmp(program.sent.data(), values, program.sent.size()) == 0) return;
+    for (std::size_t i = 0; i < program.layout.uniforms.size(); ++i) Send(program, i, values);
+}
+
+GlPrograms::Program* GlPrograms::Find(GLuint name) {
     if (mLastName != name) {
         auto const found = mPrograms.find(name);
         mLast = found == mPrograms.end() ? nullptr : &found->second;
         mLastName = name;
     }
-    if (!mLast || mLast->sent.empty()) return;
-    Program& program = *mLast;
-    if (std::memcmp(program.sent.data(), values, program.sent.size()) == 0) return;
-    for (std::size_t i = 0; i < program.layout.uniforms.size(); ++i) Send(program, i, values);
+    return mLast;
+}
+
+GlVariants* GlPrograms::GetVariants(GLuint name) {
+    Program const* const program = Find(name);
+    return program ? program->variants.get() : nullptr;
 }
 
 void GlPrograms::Send(Program& program, std::size_t index, unsigned char const* values) {

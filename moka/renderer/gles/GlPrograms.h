@@ -4,7 +4,9 @@
 
 #include "moka/renderer/device/ProgramLayout.h"
 #include "moka/renderer/gles/GlFunctions.h"
+#include "moka/renderer/gles/GlVariants.h"
 
+#include <memory>
 #include <unordered_map>
 #include <vector>
 
@@ -14,26 +16,31 @@ class GlState;
 
 class GlPrograms {
 public:
-    explicit GlPrograms(GlState& state) : mState(state) {}
+    GlPrograms(GlState& state, GlDebug const& debug) : mState(state), mDebug(debug) {}
 
     // Reads the program's uniforms. Those of types that no parameter has are logged by name and left out.
-    void Add(GLuint program, char const* label, ProgramLayout* layout);
+    void Add(GLuint program, GlslStages sources, char const* label, ProgramLayout* layout);
     void Delete(GLuint program);
 
     // Makes the program current, with these values. A program that failed to link has no values.
     void Apply(GLuint program, unsigned char const* values);
+    // Null for a program that failed to link.
+    GlVariants* GetVariants(GLuint program);
 
 private:
     struct Program {
         ProgramLayout layout;
         std::vector<GLint> locations; // by uniform
         std::vector<unsigned char> sent;
+        std::unique_ptr<GlVariants> variants;
     };
 
     static void AddUniform(GLuint name, GLuint index, char const* label, Program& program);
+    Program* Find(GLuint program);
     void Send(Program& program, std::size_t uniform, unsigned char const* values);
 
     GlState& mState;
+    GlDebug const& mDebug;
     std::unordered_map<GLuint, Program> mPrograms;
     // The program applied last, which the next draw uses as well in most cases.
     GLuint mLastName = 0;

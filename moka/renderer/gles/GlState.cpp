@@ -35,6 +35,7 @@ void GlState::Invalidate() {
     stencil.Forget();
     vertexArray.Forget();
     arrayBuffer.Forget();
+    uniformBuffer.Forget();
     unpack.Forget();
     pack.Forget();
     std::fill(mUnits.begin(), mUnits.end(), Unit{});
@@ -116,8 +117,10 @@ void GlState::ForgetVertexArray(GLuint name) {
     if (GLuint* const bound = vertexArray.Known(); bound && *bound == name) *bound = 0;
 }
 
-void GlState::ForgetArrayBuffer(GLuint name) {
-    if (GLuint* const bound = arrayBuffer.Known(); bound && *bound == name) *bound = 0;
+void GlState::ForgetBuffer(GLuint name) {
+    for (GLuint* const bound : {arrayBuffer.Known(), uniformBuffer.Known()}) {
+        if (bound && *bound == name) *bound = 0;
+    }
 }
 
 void GlState::ForgetFrameBuffer(GLuint frameBuffer) {

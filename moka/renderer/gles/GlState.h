@@ -45,6 +45,7 @@ public:
     GlShadow<GlStencilAccess> stencil{counters};
     GlShadow<GlVertexArrayAccess> vertexArray{counters};
     GlShadow<GlArrayBufferAccess> arrayBuffer{counters};
+    GlShadow<GlUniformBufferAccess> uniformBuffer{counters};
     GlShadow<GlPixelStoreAccess<GlUnpackNames>> unpack{counters};
     GlShadow<GlPixelStoreAccess<GlPackNames>> pack{counters};
 
@@ -60,7 +61,8 @@ public:
     void ForgetTexture(GLuint texture);
     void ForgetSampler(GLuint sampler);
     void ForgetVertexArray(GLuint name);
-    void ForgetArrayBuffer(GLuint name);
+    // Of vertices or of uniforms.
+    void ForgetBuffer(GLuint name);
     void ForgetFrameBuffer(GLuint frameBuffer);
 
 private:

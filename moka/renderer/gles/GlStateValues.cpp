@@ -146,4 +146,8 @@ GLuint GlArrayBufferAccess::Query() { return QueryName(GL_ARRAY_BUFFER_BINDING);
 
 void GlArrayBufferAccess::Apply(GLuint value, GLuint const*) { Gl::BindBuffer(GL_ARRAY_BUFFER, value); }
 
+GLuint GlUniformBufferAccess::Query() { return QueryName(GL_UNIFORM_BUFFER_BINDING); }
+
+void GlUniformBufferAccess::Apply(GLuint value, GLuint const*) { Gl::BindBuffer(GL_UNIFORM_BUFFER, value); }
+
 } // namespace Moka::detail

@@ -148,6 +148,13 @@ struct GlArrayBufferAccess {
     static void Apply(Value value, Value const* known);
 };
 
+// The general binding, not the numbered ones.
+struct GlUniformBufferAccess {
+    using Value = GLuint;
+    static Value Query();
+    static void Apply(Value value, Value const* known);
+};
+
 // How pixels lie in memory, as far as it concerns two-dimensional transfers. The default values are GL's own;
 // the renderer leaves them behind after each transfer.
 struct GlPixelStore {

@@ -12,6 +12,7 @@ void GlSubmitter::Submit(DrawList const& list) {
         mDevice.host.SaveVertexInput();
         mDevice.vertexFormats.Upload(list.vertices);
     }
+    mDevice.mergedRuns.Prepare(list);
     for (Command const& command : list.commands) {
         std::visit([this](auto const& one) { Execute(one); }, command);
     }
@@ -21,9 +22,14 @@ void GlSubmitter::Submit(DrawList const& list) {
 void GlSubmitter::Execute(Run const& run) {
     RunState const& state = mList->states[run.state];
     if (&state != mApplied) Apply(state);
-    mDevice.programs.Apply(state.program, mList->uniforms.data() + run.uniforms);
-    Gl::DrawArrays(ToGlPrimitive(state.primitive), run.first, run.count);
-    ++mDevice.counters.draws;
+    if (mDevice.mergedRuns.Draw(*mList, run)) return;
+    mDevice.vertexFormats.Bind(state.format);
+    for (std::size_t i = 0; i < run.recordCount; ++i) {
+        Record const& record = mList->records[run.firstRecord + i];
+        mDevice.programs.Apply(state.program, mList->uniforms.data() + record.values);
+        Gl::DrawArrays(ToGlPrimitive(state.primitive), record.first, record.count);
+        ++mDevice.counters.draws;
+    }
 }
 
 void GlSubmitter::Apply(RunState const& state) {
@@ -40,7 +46,6 @@ void GlSubmitter::Apply(RunState const& state) {
     for (TextureRef const& texture : state.textures) {
         if (texture.texture != 0) mDevice.BindTexture(texture);
     }
-    mDevice.vertexFormats.Bind(state.format);
     mApplied = &state;
 }
 

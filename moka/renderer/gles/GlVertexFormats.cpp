@@ -2,6 +2,7 @@
 
 #include "moka/renderer/device/Counters.h"
 #include "moka/renderer/gles/GlState.h"
+#include "moka/renderer/gles/GlslVariant.h"
 
 #include <cstdint>
 
@@ -11,7 +12,8 @@ int GlVertexFormats::Find(VertexDescriptor const& descriptor) {
     for (std::size_t i = 0; i < mFormats.size(); ++i) {
         if (mFormats[i].descriptor == descriptor) return static_cast<int>(i);
     }
-    mFormats.push_back({descriptor, 0});
+    mFormats.emplace_back();
+    mFormats.back().descriptor = descriptor;
     return static_cast<int>(mFormats.size()) - 1;
 }
 
@@ -29,21 +31,43 @@ void GlVertexFormats::Upload(std::vector<GLfloat> const& vertices) {
 
 void GlVertexFormats::Bind(int format) {
     Format& wanted = mFormats[static_cast<std::size_t>(format)];
-    if (wanted.vertexArray == 0) {
-        MakeVertexArray(wanted);
-    } else {
+    if (wanted.vertexArray != 0) {
         mState.vertexArray.Set(wanted.vertexArray);
+        return;
     }
+    MakeVertexArray(&wanted.vertexArray);
+    SetAttributes(wanted.descriptor, 0);
 }
 
-void GlVertexFormats::MakeVertexArray(Format& format) {
-    Gl::GenVertexArrays(1, &format.vertexArray);
+void GlVertexFormats::BindNumbered(int format, int first, GLuint numberBuffer, std::size_t numbers) {
+    Format& wanted = mFormats[static_cast<std::size_t>(format)];
+    bool const isNew = wanted.numberedArray == 0;
+    if (isNew) {
+        MakeVertexArray(&wanted.numberedArray);
+        Gl::EnableVertexAttribArray(kRecordLocation);
+    } else {
+        mState.vertexArray.Set(wanted.numberedArray);
+    }
+    if (isNew || wanted.first != first) SetAttributes(wanted.descriptor, first);
+    if (isNew || wanted.numbers != numbers) {
+        mState.arrayBuffer.Set(numberBuffer);
+        auto const* const pointer = reinterpret_cast<void const*>(numbers * sizeof(GLushort));
+        Gl::VertexAttribIPointer(kRecordLocation, 1, GL_UNSIGNED_SHORT, 0, pointer);
+    }
+    wanted.first = first;
+    wanted.numbers = numbers;
+}
+
+void GlVertexFormats::MakeVertexArray(GLuint* vertexArray) {
+    Gl::GenVertexArrays(1, vertexArray);
     ++mState.counters.buffers;
-    mState.vertexArray.Set(format.vertexArray);
+    mState.vertexArray.Set(*vertexArray);
+}
+
+void GlVertexFormats::SetAttributes(VertexDescriptor const& descriptor, int first) {
     mState.arrayBuffer.Set(mBuffer);
-    VertexDescriptor const& descriptor = format.descriptor;
     auto const stride = static_cast<GLsizei>(descriptor.GetFloatCount() * static_cast<int>(sizeof(GLfloat)));
-    std::uintptr_t offset = 0;
+    std::uintptr_t offset = static_cast<std::uintptr_t>(first) * static_cast<std::uintptr_t>(stride);
     for (int i = 0; i < descriptor.GetAttributeCount(); ++i) {
         int const components = descriptor.GetAttribute(i).components;
         auto const location = static_cast<GLuint>(i);
@@ -54,16 +78,21 @@ void GlVertexFormats::MakeVertexArray(Format& format) {
     }
 }
 
+void GlVertexFormats::DeleteVertexArray(GLuint vertexArray) {
+    if (vertexArray == 0) return;
+    mState.ForgetVertexArray(vertexArray);
+    Gl::DeleteVertexArrays(1, &vertexArray);
+    --mState.counters.buffers;
+}
+
 void GlVertexFormats::Clear() {
-    for (Format& format : mFormats) {
-        if (format.vertexArray == 0) continue;
-        mState.ForgetVertexArray(format.vertexArray);
-        Gl::DeleteVertexArrays(1, &format.vertexArray);
-        --mState.counters.buffers;
+    for (Format const& format : mFormats) {
+        DeleteVertexArray(format.vertexArray);
+        DeleteVertexArray(format.numberedArray);
     }
     mFormats.clear();
     if (mBuffer == 0) return;
-    mState.ForgetArrayBuffer(mBuffer);
+    mState.ForgetBuffer(mBuffer);
     Gl::DeleteBuffers(1, &mBuffer);
     mBuffer = 0;
     --mState.counters.buffers;

@@ -23,6 +23,9 @@ public:
     void Upload(std::vector<GLfloat> const& vertices);
     // Within an operation: draws read the buffer in this layout.
     void Bind(int format);
+    // The same, with vertex 0 of a draw at vertex first of the buffer, and a number for each vertex at
+    // GlslVariant's location, from numbers on.
+    void BindNumbered(int format, int first, GLuint numberBuffer, std::size_t numbers);
 
     void Clear();
 
@@ -30,9 +33,14 @@ private:
     struct Format {
         VertexDescriptor descriptor;
         GLuint vertexArray = 0;
+        GLuint numberedArray = 0;
+        int first = 0; // what the numbered array was set to
+        std::size_t numbers = 0;
     };
 
-    void MakeVertexArray(Format& format);
+    void MakeVertexArray(GLuint* vertexArray);
+    void SetAttributes(VertexDescriptor const& descriptor, int first);
+    void DeleteVertexArray(GLuint vertexArray);
 
     GlState& mState;
     std::vector<Format> mFormats;

@@ -1,11 +1,27 @@
 #include "moka/renderer/record/DrawListBuilder.h"
 
+#include "moka/renderer/device/Counters.h"
 #include "moka/renderer/record/ProgramState.h"
 
 #include <algorithm>
 #include <cstring>
+#include <new>
 
 namespace Moka::detail {
+namespace {
+
+// A bit for each integer whose values differ.
+std::uint32_t FindVarying(unsigned char const* a, unsigned char const* b, ProgramLayout const& layout) {
+    std::uint32_t varying = 0;
+    std::uint32_t bit = 1;
+    for (std::size_t at = layout.integersBegin; at < layout.integersEnd; at += sizeof(std::int32_t)) {
+        if (std::memcmp(a + at, b + at, sizeof(std::int32_t)) != 0) varying |= bit;
+        bit <<= 1;
+    }
+    return varying;
+}
+
+} // namespace
 
 ListVertices DrawListBuilder::AddVertices(float const* vertices, int count, int stride,
                                           ListVertices const& previous) {
@@ -26,21 +42,37 @@ bool DrawListBuilder::IsUndrawnEnd(ListVertices const& vertices) const {
 }
 
 void DrawListBuilder::AddDraw(RunState const& state, bool isKnownSame, ProgramState& program,
-                              ListVertices const& vertices, int first, int count) {
-    int const start = static_cast<int>(vertices.offset / vertices.stride) + first;
-    Run const run{AddState(state, isKnownSame), AddValues(program), start, count};
-    if (!Extend(run)) mList.commands.emplace_back(run);
+                              ListDraw const& draw) {
+    ListVertices const& vertices = draw.vertices;
+    std::size_t const stateIndex = AddState(state, isKnownSame);
+    Record const record{AddValues(program), static_cast<int>(vertices.offset / vertices.stride) + draw.first,
+                        draw.count};
+    OpenRun* const run = FindRun(stateIndex, draw.bounds);
+    if (run && MayJoin(*run, program, record)) {
+        Join(*run, program, record);
+        run->bounds.Add(draw.bounds);
+    } else {
+        OpenNewRun(stateIndex, record, vertices.stride);
+        mRuns[mRunCount - 1].bounds.Add(draw.bounds);
+    }
     mDrawnFloats = std::max(mDrawnFloats, vertices.offset + vertices.size);
 }
 
 std::size_t DrawListBuilder::AddState(RunState const& state, bool isKnownSame) {
-    bool const isSame = !mList.states.empty() && (isKnownSame || mList.states.back() == state);
-    if (!isSame) {
-        UseTexture(state.target.texture);
-        for (TextureRef const& texture : state.textures) UseTexture(texture.texture);
-        mList.states.push_back(state);
+    std::vector<RunState>& states = mList.states;
+    if (!states.empty() && isKnownSame) return mLastState;
+    std::size_t const reach = std::min(states.size(), kReach);
+    auto const found =
+        std::find(states.rbegin(), states.rbegin() + static_cast<std::ptrdiff_t>(reach), state);
+    if (found != states.rbegin() + static_cast<std::ptrdiff_t>(reach)) {
+        mLastState = static_cast<std::size_t>(states.rend() - found) - 1;
+        return mLastState;
     }
-    return mList.states.size() - 1;
+    UseTexture(state.target.texture);
+    for (TextureRef const& texture : state.textures) UseTexture(texture.texture);
+    states.push_back(state);
+    mLastState = states.size() - 1;
+    return mLastState;
 }
 
 std::size_t DrawListBuilder::AddValues(ProgramState& program) {
@@ -58,47 +90,151 @@ std::size_t DrawListBuilder::AddValues(ProgramState& program) {
     return listed.offset;
 }
 
-bool DrawListBuilder::Extend(Run const& run) {
-    if (mList.commands.empty()) return false;
-    auto* const last = std::get_if<Run>(&mList.commands.back());
-    if (!last || last->state != run.state || last->uniforms != run.uniforms) return false;
-    bool const isNext = last->first + last->count == run.first;
+DrawListBuilder::OpenRun* DrawListBuilder::FindRun(std::size_t state, DrawBounds const& bounds) {
     // Joined strips would be connected by triangles that nobody asked for.
-    if (!isNext || mList.states[run.state].primitive != PrimitiveType::TriangleList) return false;
-    last->count += run.count;
-    return true;
+    if (mList.states[state].primitive != PrimitiveType::TriangleList) return nullptr;
+    std::size_t const reach = mMerges ? kReach : 1;
+    for (std::size_t i = mRunCount; i > mFirstOpenRun && mRunCount - i < reach; --i) {
+        OpenRun& run = mRuns[i - 1];
+        if (run.state == state) return &run;
+        // Another target's texture may be sampled by what lies between.
+        bool const hasOneTarget =
+            mList.states[run.state].target.frameBuffer == mList.states[state].target.frameBuffer;
+        if (!hasOneTarget || run.bounds.MayTouch(bounds)) return nullptr;
+    }
+    return nullptr;
 }
 
-void DrawListBuilder::Add(ColorClear const& clear) {
-    UseTexture(clear.target.texture);
-    mList.commands.emplace_back(clear);
+bool DrawListBuilder::MayJoin(OpenRun const& run, ProgramState const& program, Record const& record) const {
+    Record const& last = mDraws[run.tail].record;
+    bool const isNext = last.first + last.count == record.first;
+    if (last.values == record.values)
+        return isNext || (mMerges && run.vertices + record.count <= kMostGathered);
+    if (!mMerges) return false;
+    if (!isNext && run.vertices + record.count > kMostGathered) return false;
+    ProgramLayout const& layout = program.GetLayout();
+    std::size_t const integers = layout.integersEnd - layout.integersBegin;
+    if (integers == 0) return true;
+    // The bits of Run::varying.
+    if (integers > 32 * sizeof(std::int32_t)) return false;
+    if (run.varying != 0 || run.draws < kLongRun) return true;
+    return std::memcmp(&mList.uniforms[last.values] + layout.integersBegin,
+                       &mList.uniforms[record.values] + layout.integersBegin, integers) == 0;
 }
 
-void DrawListBuilder::Add(DepthStencilClear const& clear) {
-    UseTexture(clear.target.texture);
-    mList.commands.emplace_back(clear);
+void DrawListBuilder::Join(OpenRun& run, ProgramState const& program, Record const& record) {
+    Record& last = mDraws[run.tail].record;
+    bool const isNext = last.first + last.count == record.first;
+    bool const isSame = last.values == record.values;
+    if (isNext && isSame) {
+        last.count += record.count;
+    } else {
+        std::uint32_t const index = AddRecord(record);
+        if (!isSame) {
+            unsigned char const* const values = mList.uniforms.data();
+            Record const& before = mDraws[run.tail].record;
+            run.varying |= FindVarying(values + before.values, values + record.values, program.GetLayout());
+        }
+        mDraws[run.tail].next = index;
+        run.tail = index;
+        run.isContiguous = run.isContiguous && isNext;
+    }
+    ++run.draws;
+    run.vertices += record.count;
 }
 
-void DrawListBuilder::Add(TextureClear const& clear) {
-    UseTexture(clear.target.texture);
-    mList.commands.emplace_back(clear);
+void DrawListBuilder::OpenNewRun(std::size_t state, Record const& record, std::size_t stride) {
+    RunEnd const end = GetEndBefore(state);
+    std::uint32_t const index = AddRecord(record);
+    if (mRuns.size() == mRunCount) mRuns.emplace_back();
+    mList.commands.emplace_back(Run{state, 0, 0, true, 0});
+    ++mCounters.runs;
+    ++mCounters.runEnds[static_cast<std::size_t>(end)];
+    OpenRun& run = mRuns[mRunCount++];
+    run.command = mList.commands.size() - 1;
+    run.state = state;
+    run.stride = stride;
+    run.head = run.tail = index;
+    run.draws = 1;
+    run.vertices = record.count;
+    run.isContiguous = true;
+    run.varying = 0;
+    run.bounds.Clear();
 }
 
-void DrawListBuilder::Add(Discard const& discard) {
-    UseTexture(discard.target.texture);
-    mList.commands.emplace_back(discard);
+std::uint32_t DrawListBuilder::AddRecord(Record const& record) {
+    // Finish() needs no memory for them.
+    if (mList.records.capacity() == mDraws.size()) mList.records.reserve(mDraws.size() * 2 + kReach);
+    mDraws.push_back({record, kEnd});
+    return static_cast<std::uint32_t>(mDraws.size() - 1);
 }
 
-void DrawListBuilder::Add(TargetCopy const& copy) {
-    UseTexture(copy.from.texture);
-    UseTexture(copy.to.texture);
-    mList.commands.emplace_back(copy);
+RunEnd DrawListBuilder::GetEndBefore(std::size_t state) const {
+    if (mList.commands.empty()) return mFlushReason;
+    if (mRunCount == mFirstOpenRun) return RunEnd::Other;
+    RunState const& a = mList.states[mRuns[mRunCount - 1].state];
+    RunState const& b = mList.states[state];
+    if (!(a.target == b.target)) return RunEnd::Target;
+    if (a.program != b.program) return RunEnd::Program;
+    if (a.format != b.format || a.primitive != b.primitive) return RunEnd::Primitive;
+    if (!(a.textures == b.textures)) return RunEnd::Texture;
+    if (!(a.blend == b.blend)) return RunEnd::Blend;
+    if (!(a.scissor == b.scissor)) return RunEnd::Scissor;
+    if (!(a.depthStencil == b.depthStencil)) return RunEnd::Clip;
+    return a.primitive == PrimitiveType::TriangleList ? RunEnd::Values : RunEnd::Primitive;
 }
 
-void DrawListBuilder::Add(TextureDraw const& draw) {
-    UseTexture(draw.from.texture);
-    UseTexture(draw.to.texture);
-    mList.commands.emplace_back(draw);
+DrawList const& DrawListBuilder::Finish() {
+    for (std::size_t i = 0; i < mRunCount; ++i) FinishRun(mRuns[i]);
+    mCounters.records += mList.records.size();
+    return mList;
+}
+
+void DrawListBuilder::FinishRun(OpenRun const& run) {
+    Run& finished = std::get<Run>(mList.commands[run.command]);
+    finished.firstRecord = mList.records.size();
+    for (std::uint32_t i = run.head; i != kEnd; i = mDraws[i].next) mList.records.push_back(mDraws[i].record);
+    finished.recordCount = mList.records.size() - finished.firstRecord;
+    finished.varying = run.varying;
+    finished.isContiguous = run.isContiguous;
+    if (!run.isContiguous) Gather(run, finished);
+}
+
+// The run's vertices are copied behind all others, in the order of its records.
+void DrawListBuilder::Gather(OpenRun const& run, Run& finished) {
+    std::vector<float>& floats = mList.vertices;
+    std::size_t const begin = (floats.size() + run.stride - 1) / run.stride * run.stride;
+    try {
+        floats.resize(begin + static_cast<std::size_t>(run.vertices) * run.stride);
+    } catch (std::bad_alloc const&) {
+        return; // each record is drawn from where it lies
+    }
+    int first = static_cast<int>(begin / run.stride);
+    for (std::size_t i = 0; i < finished.recordCount; ++i) {
+        Record& record = mList.records[finished.firstRecord + i];
+        auto const from = floats.begin() + record.first * static_cast<std::ptrdiff_t>(run.stride);
+        std::copy_n(from, static_cast<std::size_t>(record.count) * run.stride,
+                    floats.begin() + first * static_cast<std::ptrdiff_t>(run.stride));
+        record.first = first;
+        first += record.count;
+    }
+    finished.isContiguous = true;
+    JoinEqualRecords(finished);
+}
+
+// Only the last run's records are there to be joined: others follow it later.
+void DrawListBuilder::JoinEqualRecords(Run& finished) {
+    std::vector<Record>& records = mList.records;
+    std::size_t last = finished.firstRecord;
+    for (std::size_t i = last + 1; i < records.size(); ++i) {
+        if (records[i].values == records[last].values) {
+            records[last].count += records[i].count;
+        } else {
+            records[++last] = records[i];
+        }
+    }
+    records.resize(last + 1);
+    finished.recordCount = records.size() - finished.firstRecord;
 }
 
 void DrawListBuilder::UseTexture(DeviceName texture) {
@@ -112,18 +248,25 @@ bool DrawListBuilder::UsesTexture(DeviceName texture) const {
 
 bool DrawListBuilder::Uses(ProgramState const& program) const { return program.listed.list == mNumber; }
 
-void DrawListBuilder::Clear() {
+void DrawListBuilder::Clear(bool full) {
     mList.commands.clear();
     mList.states.clear();
+    mList.records.clear();
     mList.uniforms.clear();
     mList.vertices.clear();
+    mDraws.clear();
+    mRunCount = 0;
+    mFirstOpenRun = 0;
     mDrawnFloats = 0;
+    mFlushReason = full ? RunEnd::Full : RunEnd::Other;
     ++mNumber;
 }
 
 std::uint64_t DrawListBuilder::GetCapacityBytes() const {
     return mList.commands.capacity() * sizeof(Command) + mList.states.capacity() * sizeof(RunState) +
-           mList.uniforms.capacity() + mList.vertices.capacity() * sizeof(float);
+           mList.records.capacity() * sizeof(Record) + mList.uniforms.capacity() +
+           mList.vertices.capacity() * sizeof(float) + mDraws.capacity() * sizeof(Draw) +
+           mRuns.capacity() * sizeof(OpenRun);
 }
 
 } // namespace Moka::detail

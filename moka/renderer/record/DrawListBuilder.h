@@ -1,17 +1,22 @@
-// DrawListBuilder: records draws, clears and copies into a draw list and joins adjacent draws that share
-// everything. Knows which textures and programs the list uses.
+// DrawListBuilder: records draws, clears and copies into a draw list and joins draws of one state into runs.
+// Knows which textures and programs the list uses.
+// A draw joins the last run of its state. Between the two only runs may lie whose draws it does not touch, so
+// that no pixel is drawn in another order.
 // Thread: render thread.
 // Cost:   the memory of the largest list is kept and used again, so a warm builder allocates nothing.
 // Fails:  bad_alloc; the list is then as it was before the call.
 #pragma once
 
+#include "moka/renderer/RendererStatistics.h"
 #include "moka/renderer/device/DrawList.h"
+#include "moka/renderer/record/RunBounds.h"
 
 #include <cstdint>
 #include <unordered_map>
 
 namespace Moka::detail {
 
+struct Counters;
 class ProgramState;
 
 // Vertices that were handed over and lie in a list, or lay in it until it was flushed.
@@ -22,8 +27,21 @@ struct ListVertices {
     std::size_t stride = 0; // floats of one vertex
 };
 
+// Vertices to draw: count of them, from the first one on.
+struct ListDraw {
+    ListVertices const& vertices; // of the present list
+    int first;
+    int count;
+    DrawBounds bounds;
+};
+
 class DrawListBuilder {
 public:
+    explicit DrawListBuilder(Counters& counters) : mCounters(counters) {}
+
+    // Each draw is a run of its own, except where neither state nor values differ.
+    void SetMerging(bool on) { mMerges = on; }
+
     // Places the vertices at a multiple of their stride (floats of one vertex). previous are those that they
     // take the place of: at the end of the list and not drawn, they are dropped.
     ListVertices AddVertices(float const* vertices, int count, int stride, ListVertices const& previous);
@@ -32,16 +50,15 @@ public:
         return mList.vertices.data() + vertices.offset;
     }
 
-    // Draws count of the vertices, from the first one on, which lie in this list. state is compared with the
-    // last draw's unless isKnownSame; the program's values are copied if they changed.
-    void AddDraw(RunState const& state, bool isKnownSame, ProgramState& program, ListVertices const& vertices,
-                 int first, int count);
-    void Add(ColorClear const& clear);
-    void Add(DepthStencilClear const& clear);
-    void Add(TextureClear const& clear);
-    void Add(Discard const& discard);
-    void Add(TargetCopy const& copy);
-    void Add(TextureDraw const& draw);
+    // state is compared with those of the last runs unless isKnownSame as the last draw's; the program's values
+    // are copied if they changed.
+    void AddDraw(RunState const& state, bool isKnownSame, ProgramState& program, ListDraw const& draw);
+    template <class Other>
+    void Add(Other const& command) {
+        UseTextures(command);
+        mList.commands.emplace_back(command);
+        mFirstOpenRun = mRunCount;
+    }
 
     // Whether a command in the list reads or writes the texture.
     bool UsesTexture(DeviceName texture) const;
@@ -52,24 +69,79 @@ public:
     bool IsEmpty() const { return mList.commands.empty(); }
     // Large enough for the GPU to begin while the rest is recorded.
     bool IsFull() const {
-        return mList.vertices.size() >= kFullFloats || mList.commands.size() >= kFullCommands;
+        return mList.vertices.size() >= kFullFloats || mList.commands.size() >= kFullCommands ||
+               mList.uniforms.size() >= kFullBytes;
     }
-    DrawList const& GetList() const { return mList; }
-    void Clear();
+    // Complete: the runs' records and vertices are in their order.
+    DrawList const& Finish();
+    // full: the list was flushed because it had no more room.
+    void Clear(bool full);
     std::uint64_t GetCapacityBytes() const;
 
 private:
     static constexpr std::size_t kFullFloats = 1u << 18; // 1 MiB
+    static constexpr std::size_t kFullBytes = 1u << 20;
     static constexpr std::size_t kFullCommands = 1u << 13;
+    // How many runs back a draw looks for one of its state.
+    static constexpr std::size_t kReach = 16;
+    // A run that so many draws share a constant in is worth keeping that constant.
+    static constexpr int kLongRun = 32;
+    // Vertices of a run that are copied at most to make it contiguous.
+    static constexpr int kMostGathered = 1 << 14;
+    static constexpr std::uint32_t kEnd = ~std::uint32_t{0};
+
+    struct Draw {
+        Record record;
+        std::uint32_t next; // index of the run's next draw, or kEnd
+    };
+
+    struct OpenRun {
+        std::size_t command; // index into the list's commands
+        std::size_t state;   // index into the list's states
+        std::size_t stride;  // floats of one vertex
+        std::uint32_t head;  // index of the first draw
+        std::uint32_t tail;
+        int draws;
+        int vertices;
+        bool isContiguous;
+        std::uint32_t varying;
+        RunBounds bounds;
+    };
 
     bool IsUndrawnEnd(ListVertices const& vertices) const;
     std::size_t AddState(RunState const& state, bool isKnownSame);
     std::size_t AddValues(ProgramState& program);
-    bool Extend(Run const& run);
-    void UseTexture(DeviceName texture);
+    OpenRun* FindRun(std::size_t state, DrawBounds const& bounds);
+    bool MayJoin(OpenRun const& run, ProgramState const& program, Record const& record) const;
+    void Join(OpenRun& run, ProgramState const& program, Record const& record);
+    void OpenNewRun(std::size_t state, Record const& record, std::size_t stride);
+    std::uint32_t AddRecord(Record const& record);
+    RunEnd GetEndBefore(std::size_t state) const;
+    void FinishRun(OpenRun const& run);
+    void Gather(OpenRun const& run, Run& finished);
+    void JoinEqualRecords(Run& finished);
 
+    void UseTexture(DeviceName texture);
+    void UseTextures(ColorClear const& clear) { UseTexture(clear.target.texture); }
+    void UseTextures(DepthStencilClear const& clear) { UseTexture(clear.target.texture); }
+    void UseTextures(TextureClear const& clear) { UseTexture(clear.target.texture); }
+    void UseTextures(Discard const& discard) { UseTexture(discard.target.texture); }
+    template <class Copy>
+    void UseTextures(Copy const& copy) {
+        UseTexture(copy.from.texture);
+        UseTexture(copy.to.texture);
+    }
+
+    Counters& mCounters;
+    bool mMerges = true;
     DrawList mList;
-    std::size_t mDrawnFloats = 0; // draws refer to vertices before it
+    std::vector<Draw> mDraws;
+    std::vector<OpenRun> mRuns; // the first mRunCount are of this list
+    std::size_t mRunCount = 0;
+    std::size_t mFirstOpenRun = 0;       // runs before it lie behind another command
+    RunEnd mFlushReason = RunEnd::Other; // why the list before this one ended
+    std::size_t mLastState = 0;          // of the last draw
+    std::size_t mDrawnFloats = 0;        // draws refer to vertices before it
     // Numbers the lists, so that marks of earlier lists mean nothing in this one.
     std::uint64_t mNumber = 1;
     std::unordered_map<DeviceName, std::uint64_t> mTextureUses; // the number of the last list that used it

@@ -27,6 +27,7 @@ GraphicsObject::~GraphicsObject() {
 void GraphicsObject::SetVertices(int stream, void const* data, int count) {
     if (theObserver) theObserver->OnVertices(this, stream, data, count);
     mCount = 0;
+    mBounds = {};
     if (stream != 0 || count < 0 || (count > 0 && !data)) {
         __android_log_print(ANDROID_LOG_ERROR, "mok_log",
                             "vertices are refused: stream %d (there is only 0), %d of them%s", stream, count,
@@ -77,6 +78,8 @@ bool GraphicsObject::Draw(int first, int count, int instances) {
         return false;
     }
 }
+
+void GraphicsObject::SetBounds(DrawBounds const& bounds) { mBounds = bounds; }
 
 void GraphicsObject::Release() {
     Observe(ObjectKind::kGraphicsObject, this, "Release");

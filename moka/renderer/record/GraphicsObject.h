@@ -28,7 +28,9 @@ public:
     void SetVertices(int stream, void const* data, int count) override;
     bool Draw(int first, int count, int instances) override;
     void Release() override;
+    void SetBounds(DrawBounds const& bounds) override;
 
+    DrawBounds const& GetBounds() const { return mBounds; }
     // Within a request: the vertices in the present list. Throws bad_alloc.
     ListVertices const& PlaceVertices();
     // The list is about to be cleared. Without memory the object has no vertices afterwards.
@@ -43,6 +45,7 @@ private:
     int const mFormat;
     int const mFloatsPerVertex;
     int mCount = 0;
+    DrawBounds mBounds;
     ListVertices mPlace;
     std::uint64_t mHeldList = 0; // the list that calls KeepVertices
     std::vector<float> mKept;    // used while the list does not have them; its memory is used again

@@ -38,6 +38,7 @@ public:
     bool CanDraw() const { return mName != 0 && mLayout.draws; }
     DeviceName GetName() const { return mName; }
     char const* GetLabel() const { return mLabel.c_str(); }
+    ProgramLayout const& GetLayout() const { return mLayout; }
     std::size_t GetSamplerCount() const { return mLayout.samplers.size(); }
     // The texture unit that the sampler is set to.
     int GetSamplerUnit(std::size_t sampler) const;

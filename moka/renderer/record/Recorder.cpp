@@ -17,6 +17,7 @@ std::shared_ptr<Recorder> Recorder::Create(RendererLimits const& limits, Rendere
     if (!recorder->mDevice) return nullptr;
     DeviceCaps const caps = recorder->mDevice->GetCaps();
     RecorderCaps::Get().Set(caps, limits);
+    recorder->list.SetMerging(limits.mergesDraws);
     recorder->requested.emplace(*recorder->mDevice, caps.samplingUnits);
     return recorder;
 }
@@ -75,7 +76,8 @@ bool Recorder::Draw(GraphicsObject& object, int format, PrimitiveType primitive,
     RunState& state = requested->Resolve(mActive ? mActive->GetRef() : GetCurrentTarget(), format, primitive);
     if (state.target.texture != 0 && program->GetSamplerCount() > 0) SampleCopyOfTarget(state);
     // Only now: a flush on the way here takes vertices out of the list.
-    list.AddDraw(state, !requested->IsChanged(), *program, object.PlaceVertices(), first, count);
+    list.AddDraw(state, !requested->IsChanged(), *program,
+                 {object.PlaceVertices(), first, count, object.GetBounds()});
     requested->SetChanged(false);
     if (isHosts || mIsExternal || list.IsFull()) Flush();
     return true;
@@ -113,11 +115,12 @@ void Recorder::AfterAdding() {
 
 void Recorder::Flush() {
     if (list.IsEmpty()) return;
-    mDevice->Submit(list.GetList());
+    bool const isFull = list.IsFull();
+    mDevice->Submit(list.Finish());
     ++counters.flushes;
     for (GraphicsObject* const holder : mHolders) holder->KeepVertices();
     mHolders.clear();
-    list.Clear();
+    list.Clear(isFull);
     counters.listBytes.Set(list.GetCapacityBytes());
     if (mHasDropped) DeleteDropped();
 }

@@ -101,7 +101,7 @@ public:
     void DropTextureObject();
 
     Counters counters;
-    DrawListBuilder list;
+    DrawListBuilder list{counters};
     DepthStencilPool depthStencilPool{*this};
     Fill fill;
     // Present while attached.

@@ -1,0 +1,31 @@
+// ProjectedBounds.h: where on the target the vertices of a drawable lie, so that the renderer may join draws that
+// do not touch.
+#pragma once
+
+#include "moka/base/Rect.h"
+#include "moka/graphics/math/Matrix4.h"
+#include "moka/renderer/DrawBounds.h"
+
+#include <cmath>
+
+namespace Moka::detail {
+
+// box is in units of the projection's source; its sides may be in any order. Unknown under a projection with
+// perspective.
+inline DrawBounds Project(RectF const& box, Matrix4<float> const& m) {
+    if (m[3] != 0.0f || m[7] != 0.0f || m[15] != 1.0f) return {};
+    float const x = (box.left + box.right) * 0.5f;
+    float const y = (box.top + box.bottom) * 0.5f;
+    float const halfWidth = std::fabs(box.right - box.left) * 0.5f;
+    float const halfHeight = std::fabs(box.bottom - box.top) * 0.5f;
+    float const centerX = m[0] * x + m[4] * y + m[12];
+    float const centerY = m[1] * x + m[5] * y + m[13];
+    // The GPU rounds in its own way.
+    constexpr float kLarger = 1.0001f;
+    constexpr float kMargin = 1e-5f;
+    float const reachX = (std::fabs(m[0]) * halfWidth + std::fabs(m[4]) * halfHeight) * kLarger + kMargin;
+    float const reachY = (std::fabs(m[1]) * halfWidth + std::fabs(m[5]) * halfHeight) * kLarger + kMargin;
+    return {centerX - reachX, centerY - reachY, centerX + reachX, centerY + reachY};
+}
+
+} // namespace Moka::detail

@@ -1,0 +1,33 @@
+// RunBounds: where the draws of one run lie on their target, so that a later draw can tell whether it touches any
+// of them. A box that is not known touches everything.
+// Units: normalized device coordinates.
+// Cost:  boxes are grouped by eight, so that most of a run is passed over. A run of many draws answers that it
+//        is touched. The memory is kept for the next list.
+#pragma once
+
+#include "moka/renderer/DrawBounds.h"
+
+#include <vector>
+
+namespace Moka::detail {
+
+class RunBounds {
+public:
+    void Clear();
+    // Without memory nothing is known any more.
+    void Add(DrawBounds const& box) noexcept;
+    bool MayTouch(DrawBounds const& box) const;
+
+private:
+    void AddKnown(DrawBounds const& box);
+
+    static constexpr std::size_t kGroup = 8;
+    static constexpr std::size_t kMostBoxes = 1024;
+
+    DrawBounds mAll;
+    bool mIsKnown = true; // each box is known, and there are not too many
+    std::vector<DrawBounds> mBoxes;
+    std::vector<DrawBounds> mGroups;
+};
+
+} // namespace Moka::detail
