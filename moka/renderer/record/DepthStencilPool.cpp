@@ -37,6 +37,7 @@ void DepthStencilPool::Clear() {
 }
 
 void DepthStencilPool::DeleteOldest() {
+    mRecorder.ForgetStencil(mWaiting.front().name);
     mRecorder.GetDevice().DeleteDepthStencil(mWaiting.front().name);
     mWaiting.pop_front();
     --mRecorder.counters.pooledRenderBuffers;

@@ -58,6 +58,26 @@ void DrawListBuilder::AddDraw(RunState const& state, bool isKnownSame, ProgramSt
     mDrawnFloats = std::max(mDrawnFloats, vertices.offset + vertices.size);
 }
 
+void DrawListBuilder::AddSeparateDraw(SeparateDraw const& draw) {
+    ListVertices const vertices = AddVertices(draw.vertices, draw.count, draw.stride, {});
+    std::size_t const values = mList.uniforms.size();
+    mList.uniforms.insert(mList.uniforms.end(), draw.values, draw.values + draw.valueBytes);
+    UseTexture(draw.state.target.texture);
+    mList.states.push_back(draw.state);
+    OpenNewRun(mList.states.size() - 1,
+               {values, static_cast<int>(vertices.offset / vertices.stride), draw.count}, vertices.stride);
+    mRuns[mRunCount - 1].bounds.Add({});
+    mDrawnFloats = vertices.offset + vertices.size;
+}
+
+void DrawListBuilder::SetScissor(std::size_t command, ScissorState const& scissor) {
+    if (Run const* const run = std::get_if<Run>(&mList.commands[command])) {
+        mList.states[run->state].scissor = scissor;
+    } else if (auto* const clear = std::get_if<DepthStencilClear>(&mList.commands[command])) {
+        clear->scissor = scissor;
+    }
+}
+
 std::size_t DrawListBuilder::AddState(RunState const& state, bool isKnownSame) {
     std::vector<RunState>& states = mList.states;
     if (!states.empty() && isKnownSame) return mLastState;

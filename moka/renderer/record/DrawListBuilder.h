@@ -35,6 +35,15 @@ struct ListDraw {
     DrawBounds bounds;
 };
 
+struct SeparateDraw {
+    RunState const& state;
+    unsigned char const* values;
+    std::size_t valueBytes;
+    float const* vertices;
+    int count;
+    int stride; // floats of one vertex
+};
+
 class DrawListBuilder {
 public:
     explicit DrawListBuilder(Counters& counters) : mCounters(counters) {}
@@ -53,6 +62,11 @@ public:
     // state is compared with those of the last runs unless isKnownSame as the last draw's; the program's values
     // are copied if they changed.
     void AddDraw(RunState const& state, bool isKnownSame, ProgramState& program, ListDraw const& draw);
+    // A draw that shares its run with no other, of values and vertices that are copied.
+    void AddSeparateDraw(SeparateDraw const& draw);
+    // Of a clear of the stencil or of a separate draw, by its place in the commands.
+    void SetScissor(std::size_t command, ScissorState const& scissor);
+    // Any command but a draw.
     template <class Other>
     void Add(Other const& command) {
         UseTextures(command);
@@ -60,6 +74,15 @@ public:
         mFirstOpenRun = mRunCount;
     }
 
+    // Drops vertices that nobody draws if they are the last ones.
+    void DropVertices(ListVertices const& vertices) {
+        if (IsUndrawnEnd(vertices)) mList.vertices.resize(vertices.offset);
+    }
+
+    // Numbers the lists from 1 on.
+    std::uint64_t GetNumber() const { return mNumber; }
+    // Not complete before Finish().
+    DrawList const& GetList() const { return mList; }
     // Whether a command in the list reads or writes the texture.
     bool UsesTexture(DeviceName texture) const;
     bool Uses(ProgramState const& program) const;
@@ -142,7 +165,7 @@ private:
     RunEnd mFlushReason = RunEnd::Other; // why the list before this one ended
     std::size_t mLastState = 0;          // of the last draw
     std::size_t mDrawnFloats = 0;        // draws refer to vertices before it
-    // Numbers the lists, so that marks of earlier lists mean nothing in this one.
+    // So that marks of earlier lists mean nothing in this one.
     std::uint64_t mNumber = 1;
     std::unordered_map<DeviceName, std::uint64_t> mTextureUses; // the number of the last list that used it
 };

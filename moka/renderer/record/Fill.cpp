@@ -28,6 +28,7 @@ void Fill::Add(Recorder& recorder, TargetRef const& target, std::array<float, 4>
     state.program = mProgram->GetName();
     state.format = mFormat;
     state.primitive = PrimitiveType::TriangleStrip;
+    recorder.BeforeDraw(state, {});
     ListVertices const corners = recorder.list.AddVertices(kCorners, 4, 2, {});
     recorder.list.AddDraw(state, false, *mProgram, {corners, 0, 4, {}});
     recorder.requested->SetChanged(true);

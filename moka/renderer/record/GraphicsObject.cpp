@@ -98,6 +98,13 @@ ListVertices const& GraphicsObject::PlaceVertices() {
     return mPlace;
 }
 
+void GraphicsObject::TakeBackVertices() noexcept {
+    if (!mRecorder->list.Has(mPlace)) return;
+    KeepVertices();
+    mRecorder->list.DropVertices(mPlace);
+    mPlace = {};
+}
+
 void GraphicsObject::KeepVertices() noexcept {
     if (mCount == 0 || !mRecorder->list.Has(mPlace)) return;
     try {

@@ -33,12 +33,16 @@ public:
     DrawBounds const& GetBounds() const { return mBounds; }
     // Within a request: the vertices in the present list. Throws bad_alloc.
     ListVertices const& PlaceVertices();
+    // Null without vertices.
+    float const* GetVertices() const;
+    int GetStride() const { return mFloatsPerVertex; }
+    // The list does not need the vertices; the object keeps them.
+    void TakeBackVertices() noexcept;
     // The list is about to be cleared. Without memory the object has no vertices afterwards.
     void KeepVertices() noexcept;
 
 private:
     void HandOver(float const* data, int count);
-    float const* GetVertices() const;
 
     std::shared_ptr<Recorder> const mRecorder;
     PrimitiveType const mPrimitive;

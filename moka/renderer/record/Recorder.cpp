@@ -75,6 +75,15 @@ bool Recorder::Draw(GraphicsObject& object, int format, PrimitiveType primitive,
     }
     RunState& state = requested->Resolve(mActive ? mActive->GetRef() : GetCurrentTarget(), format, primitive);
     if (state.target.texture != 0 && program->GetSamplerCount() > 0) SampleCopyOfTarget(state);
+    if (!mFlushesAtOnce &&
+        mStencils.TakeDraw(state, *program,
+                           object.GetVertices() + static_cast<std::ptrdiff_t>(first) * object.GetStride(),
+                           count, object.GetStride())) {
+        requested->SetChanged(true);
+        object.TakeBackVertices();
+        return true;
+    }
+    mStencils.BeforeDraw(state, object.GetBounds());
     // Only now: a flush on the way here takes vertices out of the list.
     list.AddDraw(state, !requested->IsChanged(), *program,
                  {object.PlaceVertices(), first, count, object.GetBounds()});
@@ -109,8 +118,17 @@ void Recorder::SampleCopyOfTarget(RunState& state) {
     }
 }
 
-void Recorder::AfterAdding() {
+void Recorder::AfterDraw() {
     if (mFlushesAtOnce || list.IsFull()) Flush();
+}
+
+void Recorder::AddStencilClear(DepthStencilClear const& clear) {
+    if (mFlushesAtOnce) {
+        mStencils.Forget(clear.target.depthStencil);
+    } else if (mStencils.TakeClear(clear)) {
+        return;
+    }
+    Add(clear);
 }
 
 void Recorder::Flush() {
@@ -165,7 +183,9 @@ void Recorder::FlushForHost() {
 
 void Recorder::CommitForExternal() {
     if (!Begin()) return;
+    mStencils.Finish();
     Flush();
+    mStencils.ForgetAll();
     StateCommit commit;
     requested->AddStatesTo(commit);
     if (mActive) commit.target = &mActive->GetRef();
@@ -186,13 +206,16 @@ void Recorder::InvalidateState() {
     mIsExternal = false;
     SetFlushesAtOnce();
     if (!Begin()) return;
+    mStencils.ForgetAll();
     mDevice->InvalidateState();
     requested->Forget();
 }
 
 void Recorder::SetDeferred(bool on) {
     if (!Begin()) return;
+    mStencils.Finish();
     Flush();
+    mStencils.ForgetAll();
     mIsDeferred = on;
     SetFlushesAtOnce();
     if (mActive) return;
@@ -241,6 +264,7 @@ void Recorder::Delete(Dropped const& dropped) {
         --counters.frameBuffers;
         return;
     case DroppedKind::Program:
+        mStencils.ForgetAll();
         mDevice->DeleteProgram(dropped.name);
         --counters.programs;
         return;

@@ -15,6 +15,7 @@
 #include "moka/renderer/record/DrawListBuilder.h"
 #include "moka/renderer/record/Fill.h"
 #include "moka/renderer/record/RequestedState.h"
+#include "moka/renderer/record/StencilPreparations.h"
 
 #include <atomic>
 #include <memory>
@@ -65,8 +66,18 @@ public:
     // Draws count of the object's vertices, from the first one on, with the requested state. False when nothing
     // can be drawn. Throws bad_alloc.
     bool Draw(GraphicsObject& object, int format, PrimitiveType primitive, int first, int count);
-    // After anything but a draw was added to the list.
-    void AfterAdding();
+    // Adds anything but a draw to the list, which is then flushed if it has to be.
+    template <class Other>
+    void Add(Other const& command) {
+        list.Add(command);
+        if (mFlushesAtOnce || list.IsFull()) Flush();
+    }
+    void AddStencilClear(DepthStencilClear const& clear);
+    // Around draws that the list gets in another way: clears that are drawn.
+    void BeforeDraw(RunState const& state, DrawBounds const& bounds) { mStencils.BeforeDraw(state, bounds); }
+    void AfterDraw();
+    // The contents of the buffer are lost.
+    void ForgetStencil(DeviceName depthStencil) { mStencils.Forget(depthStencil); }
     void Flush();
     // Before a texture is changed or read at once.
     void FlushIfUsed(DeviceName texture);
@@ -134,6 +145,7 @@ private:
     bool mIsExternal = false;   // between a commit and the invalidation, while GL belongs to external code
     bool mFlushesAtOnce = true; // immediate or external
     std::vector<GraphicsObject*> mHolders;
+    StencilPreparations mStencils{list};
     // A draw that samples its own target samples this copy; kept while the same size is needed.
     std::shared_ptr<TextureStorage> mTargetCopy;
 

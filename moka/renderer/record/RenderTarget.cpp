@@ -35,6 +35,7 @@ void RenderTarget::Deactivate(bool discardColor, bool discardDepthStencil) {
     if (theObserver) Observe(kKind, this, "Deactivate", discardColor, discardDepthStencil);
     if (!mRecorder->Begin() || mRecorder->GetActive() != this) return;
     if (discardColor || discardDepthStencil) {
+        if (discardDepthStencil) mRecorder->ForgetStencil(mRef.depthStencil);
         mRecorder->list.Add(Discard{mRef, discardColor, discardDepthStencil});
     }
     mRecorder->Deactivate(*this);
@@ -81,10 +82,10 @@ void RenderTarget::ClearColor(float r, float g, float b, float a) {
     if (theObserver) theObserver->OnClear({requested, this, true, color, false, 0, false, 0});
     if (requested.GetDepthStencil().IsStencil() && HasStencil()) {
         mRecorder->fill.Add(*mRecorder, mRef, color);
+        mRecorder->AfterDraw();
     } else {
-        mRecorder->list.Add(ColorClear{mRef, requested.GetScissor(), color});
+        mRecorder->Add(ColorClear{mRef, requested.GetScissor(), color});
     }
-    mRecorder->AfterAdding();
 }
 
 // A host's frame buffer may or may not have one; drawing is right either way.
@@ -138,9 +139,7 @@ void RenderTarget::ClearDepthStencil(bool clearDepth, float depth, bool clearSte
         theObserver->OnClear({requested, this, false, {}, clearDepth, depth, clearStencil, stencil});
     }
     if (!mDepthStencil || (!clearDepth && !clearStencil)) return;
-    mRecorder->list.Add(
-        DepthStencilClear{mRef, requested.GetScissor(), clearDepth, clearStencil, depth, stencil});
-    mRecorder->AfterAdding();
+    mRecorder->AddStencilClear({mRef, requested.GetScissor(), clearDepth, clearStencil, depth, stencil});
 }
 
 } // namespace Moka::detail

@@ -123,8 +123,7 @@ void TextureObject::DrawToCurrent() {
     if (!scope || IsActiveTarget()) return;
     DeviceName const frameBuffer = mStorage->TakeFrameBuffer();
     if (frameBuffer == 0) return;
-    recorder.list.Add(TextureDraw{mStorage->Describe(frameBuffer), recorder.GetCurrentTarget()});
-    recorder.AfterAdding();
+    recorder.Add(TextureDraw{mStorage->Describe(frameBuffer), recorder.GetCurrentTarget()});
     mStorage->ReturnFrameBuffer(frameBuffer);
 }
 
@@ -151,8 +150,7 @@ void TextureObject::CopyFromRenderTarget() {
     DeviceName const own = from.texture == 0 ? mStorage->TakeFrameBuffer() : 0;
     int const width = from.width > 0 ? std::min(from.width, GetWidth()) : GetWidth();
     int const height = from.height > 0 ? std::min(from.height, GetHeight()) : GetHeight();
-    recorder.list.Add(TargetCopy{from, mStorage->Describe(own), width, height});
-    recorder.AfterAdding();
+    recorder.Add(TargetCopy{from, mStorage->Describe(own), width, height});
     if (own != 0) mStorage->ReturnFrameBuffer(own);
 }
 

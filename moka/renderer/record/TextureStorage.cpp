@@ -38,8 +38,7 @@ TextureStorage::~TextureStorage() {
 bool TextureStorage::Clear() {
     DeviceName const frameBuffer = TakeFrameBuffer();
     if (frameBuffer == 0) return false;
-    mRecorder->list.Add(TextureClear{Describe(frameBuffer)});
-    mRecorder->AfterAdding();
+    mRecorder->Add(TextureClear{Describe(frameBuffer)});
     ReturnFrameBuffer(frameBuffer);
     return true;
 }
