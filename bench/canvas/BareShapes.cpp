@@ -93,6 +93,48 @@ void main() {
 }
 )";
 
+// Of one batch: the place in the shape and its sizes, and a colour.
+constexpr char kBatchVertex[] = R"(#version 300 es
+layout(location = 0) in vec2 position;
+layout(location = 1) in vec4 place;
+layout(location = 2) in vec4 color;
+out highp vec2 local;
+flat out highp vec2 size;
+flat out mediump vec4 flatColor;
+void main() {
+    local = place.xy;
+    size = place.zw;
+    flatColor = color;
+    gl_Position = vec4(position / 512.0 - 1.0, 0.0, 1.0);
+}
+)";
+constexpr char kBatchRectFragment[] = R"(#version 300 es
+precision mediump float;
+flat in vec4 flatColor;
+out vec4 result;
+void main() { result = flatColor; }
+)";
+constexpr char kBatchCircleFragment[] = R"(#version 300 es
+precision mediump float;
+in highp vec2 local;
+flat in highp vec2 size;
+flat in vec4 flatColor;
+out vec4 result;
+void main() { result = flatColor * clamp(size.x + 0.5 - length(local), 0.0, 1.0); }
+)";
+constexpr char kBatchLineFragment[] = R"(#version 300 es
+precision mediump float;
+in highp vec2 local;
+flat in highp vec2 size;
+flat in vec4 flatColor;
+out vec4 result;
+void main() {
+    highp float along = min(local.x, size.y - local.x) + 0.5;
+    highp float across = size.x + 0.5 - abs(local.y);
+    result = flatColor * clamp(min(along, across), 0.0, 1.0);
+}
+)";
+
 constexpr char kBlurVertex[] = R"(#version 300 es
 layout(location = 0) in vec2 position;
 out vec2 uv;
@@ -213,6 +255,50 @@ void BareQuads::Draw(std::vector<RectF> const& dsts) {
     mProgram.Use();
     SetUniforms(mProgram, {1, 1, 1, 1});
     mSource.Sample();
+    mVertices.Upload(mFloats);
+    glDrawArrays(GL_TRIANGLES, 0, mVertices.Count(mFloats));
+}
+
+BareBatch::BareBatch(Shape shape)
+    : mShape(shape),
+      mProgram(kBatchVertex, shape == Shape::Rect     ? kBatchRectFragment
+                             : shape == Shape::Circle ? kBatchCircleFragment
+                                                      : kBatchLineFragment) {}
+
+void BareBatch::Draw(int count, int size) {
+    constexpr float kLineWidth = 4;
+    auto const side = static_cast<float>(size);
+    Writer writer(mFloats, CountFloats(static_cast<std::size_t>(count), 10));
+    for (int i = 0; i < count; ++i) {
+        RectF const box = BoxOf(i, size);
+        Vector4<float> const c = Premultiply(ColorOf(i, Colors::Distinct));
+        auto const write = [&](float x, float y, float localX, float localY, float width, float length) {
+            writer.Write(x, y, localX, localY, width, length, c.x, c.y, c.z, c.w);
+        };
+        if (mShape == Shape::Rect) {
+            ForEachCorner(box, [&](float x, float y, float, float) { write(x, y, 0, 0, 0, 0); });
+        } else if (mShape == Shape::Circle) {
+            float const half = side / 2;
+            PointF const center(box.left + half, box.top + half);
+            RectF const hull(box.left - 0.5f, box.top - 0.5f, box.right + 0.5f, box.bottom + 0.5f);
+            ForEachCorner(hull, [&](float x, float y, float, float) {
+                write(x, y, x - center.x, y - center.y, half, 0);
+            });
+        } else {
+            // The diagonal of the box.
+            float const length = std::hypot(side, side);
+            float const reach = kLineWidth / 2 + 0.5f;
+            float const direction = side / length;
+            RectF const local(-reach, -reach, length + reach, reach);
+            ForEachCorner(local, [&](float along, float across, float, float) {
+                write(box.left + (along - across) * direction, box.top + (along + across) * direction, along,
+                      across, kLineWidth / 2, length);
+            });
+        }
+    }
+    mTarget.DrawInto();
+    SetBareState();
+    mProgram.Use();
     mVertices.Upload(mFloats);
     glDrawArrays(GL_TRIANGLES, 0, mVertices.Count(mFloats));
 }

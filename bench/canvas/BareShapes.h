@@ -41,6 +41,22 @@ private:
     std::vector<float> mFloats;
 };
 
+// Shapes of one kind and of distinct colours in one call. Each vertex has all that its shape's program needs.
+class BareBatch {
+public:
+    enum class Shape { Rect, Circle, Line };
+
+    explicit BareBatch(Shape shape);
+    void Draw(int count, int size);
+
+private:
+    Shape const mShape;
+    BareImage mTarget{kSide, kSide};
+    BareProgram mProgram;
+    BareVertices mVertices{2, 4, 4};
+    std::vector<float> mFloats;
+};
+
 class BareLines {
 public:
     BareLines();

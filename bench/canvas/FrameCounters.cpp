@@ -52,6 +52,8 @@ void FrameCounters::ReportStatistics() {
     auto const report = [&](char const* name, std::uint64_t RendererStatistics::*member) {
         mState.counters[name] = static_cast<double>(after.*member - before.*member);
     };
+    report("runs", &RendererStatistics::runs);
+    report("records", &RendererStatistics::records);
     report("draws", &RendererStatistics::draws);
     report("flushes", &RendererStatistics::flushes);
     report("targets", &RendererStatistics::frameBufferSwitches);

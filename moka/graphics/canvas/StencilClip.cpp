@@ -67,6 +67,10 @@ void StencilClip::Draw(ClipList const& clips, IMKBitmapWritable& frameBuffer) {
     mBlend->Apply();
     mDepthStencil->Apply();
     mShader->program->MakeCurrent();
+    // Nobody sees the colour. The same one each time lets the renderer find that nothing has changed.
+    mShader->uColor = Vector4<float>(0, 0, 0, 0);
+    mShader->uTintColor = Vector4<float>(0, 0, 0, 0);
+    mShader->uHasTintColor = 0;
     ClearStencil(frameBuffer, initial);
     DrawClips(clips, frameBuffer);
     AllowWhereOne();

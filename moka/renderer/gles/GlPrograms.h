@@ -13,10 +13,12 @@
 namespace Moka::detail {
 
 class GlState;
+class GlWorkarounds;
 
 class GlPrograms {
 public:
-    GlPrograms(GlState& state, GlDebug const& debug) : mState(state), mDebug(debug) {}
+    GlPrograms(GlState& state, GlDebug const& debug, GlWorkarounds const& workarounds)
+        : mState(state), mDebug(debug), mWorkarounds(workarounds) {}
 
     // Reads the program's uniforms. Those of types that no parameter has are logged by name and left out.
     void Add(GLuint program, GlslStages sources, char const* label, ProgramLayout* layout);
@@ -41,6 +43,7 @@ private:
 
     GlState& mState;
     GlDebug const& mDebug;
+    GlWorkarounds const& mWorkarounds;
     std::unordered_map<GLuint, Program> mPrograms;
     // The program applied last, which the next draw uses as well in most cases.
     GLuint mLastName = 0;

@@ -9,6 +9,7 @@ namespace Moka::detail {
 enum class GlWorkaround : unsigned {
     BindForDrawingToRead,
     FinishBeforeCopies,
+    AvoidMediump,
 };
 
 class GlWorkarounds {

@@ -104,8 +104,8 @@ std::vector<Field> ListFields(GlslVariantRequest const& request) {
 // One stage, rewritten token by token. Lines keep their numbers.
 class StageRewriter {
 public:
-    StageRewriter(std::string_view source, bool isVertex, std::vector<Field> const& fields)
-        : mTokens(SplitGlsl(source)), mIsVertex(isVertex), mFields(fields) {}
+    StageRewriter(std::string_view source, bool isVertex, bool isHighp, std::vector<Field> const& fields)
+        : mTokens(SplitGlsl(source)), mIsVertex(isVertex), mIsHighp(isHighp), mFields(fields) {}
 
     void Rewrite() {
         for (mAt = 0; mAt < mTokens.size();) TakeToken();
@@ -184,7 +184,9 @@ private:
         }
         if (mDepth == 0) CountVarying(word);
         mStartsStatement = false;
-        if (word == "main") {
+        if (mIsHighp && IsPrecision(word)) {
+            mBody += "highp";
+        } else if (word == "main") {
             mHasMain = mHasMain || mDepth == 0;
             mBody += "mokaMain";
         } else if (mIsOld && word == "varying") {
@@ -225,7 +227,7 @@ private:
         std::string_view word = NextWord();
         std::string precision;
         if (IsPrecision(word)) {
-            precision = std::string(word) + " ";
+            precision = mIsHighp ? "highp " : std::string(word) + " ";
             word = NextWord();
         }
         std::string const type(word);
@@ -264,8 +266,7 @@ private:
         if (found != mFields.end()) {
             mUsed.push_back(&*found);
             if (!mIsVertex) {
-                std::string const handed = std::string("highp ") + GetTypeName(found->uniform->type);
-                mBody += "flat in " + handed + " moka_" + name + "; ";
+                mBody += "flat in " + precision + GetTypeName(found->uniform->type) + " moka_" + name + "; ";
             }
         }
         mBody += precision + type + " " + name + ";";
@@ -273,6 +274,7 @@ private:
 
     std::vector<GlslToken> const mTokens;
     bool const mIsVertex;
+    bool const mIsHighp;
     std::vector<Field> const& mFields;
     std::size_t mAt = 0;
     std::string mBody;
@@ -313,10 +315,13 @@ std::string MakeVertexStage(StageRewriter const& stage, StageRewriter const& fra
     return text + "#line 1\n" + stage.GetBody() + "\nvoid main() {\n" + copies + "    mokaMain();\n}\n";
 }
 
-std::string MakeFragmentStage(StageRewriter const& stage) {
+std::string MakeFragmentStage(StageRewriter const& stage, bool isHighp) {
     std::string text = "#version 300 es\n" + stage.GetExtensions();
     // As precise as gl_FragColor.
-    if (stage.WritesFragColor()) text += "layout(location = 0) out mediump vec4 mokaFragColor;\n";
+    if (stage.WritesFragColor()) {
+        text += std::string("layout(location = 0) out ") + (isHighp ? "highp" : "mediump") +
+                " vec4 mokaFragColor;\n";
+    }
     text += "#line 1\n" + stage.GetBody() + "\nvoid main() {\n";
     for (Field const* field : stage.GetUsed()) text += Assign(*field, "moka_" + field->uniform->name);
     return text + "    mokaMain();\n}\n";
@@ -338,8 +343,8 @@ GlslStages Rewrite(GlslVariantRequest const& request) {
     std::vector<Field> const fields = ListFields(request);
     if (fields.empty()) Refuse("it has no uniforms");
     if (GetRecordsPerBlock(request.layout) == 0) Refuse("its uniforms are too large for a block");
-    StageRewriter vertex(request.sources.vertex, true, fields);
-    StageRewriter fragment(request.sources.fragment, false, fields);
+    StageRewriter vertex(request.sources.vertex, true, request.isHighp, fields);
+    StageRewriter fragment(request.sources.fragment, false, request.isHighp, fields);
     vertex.Rewrite();
     fragment.Rewrite();
     CheckDeclared(fields, vertex, fragment);
@@ -348,7 +353,8 @@ GlslStages Rewrite(GlslVariantRequest const& request) {
         varyings += field->uniform->type == BindingTypeMatrix4 ? 4 : 1;
     }
     if (varyings > kMostVaryings) Refuse("it would need " + std::to_string(varyings) + " varyings");
-    return {MakeVertexStage(vertex, fragment, fields, request.layout), MakeFragmentStage(fragment)};
+    return {MakeVertexStage(vertex, fragment, fields, request.layout),
+            MakeFragmentStage(fragment, request.isHighp)};
 }
 
 } // namespace

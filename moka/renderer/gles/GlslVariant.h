@@ -34,8 +34,9 @@ struct GlslVariantRequest {
     GlslStages const& sources; // GLSL ES 1.00 or 3.00
     ProgramLayout const& layout;
     std::uint32_t varying; // as Run has it
-    std::vector<std::int32_t> const&
-        integers; // of all ints and bools; those that do not vary become constants
+    // Of all ints and bools, in the order of their offsets. Those that do not vary become constants.
+    std::vector<std::int32_t> const& integers;
+    bool isHighp; // lower precisions become highp
 };
 
 // Bytes from one record to the next: std140 of the program's values up to the texture units.
