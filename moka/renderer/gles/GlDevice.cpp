@@ -6,6 +6,7 @@
 #include "moka/renderer/gles/GlTables.h"
 
 #include <cstdio>
+#include <utility>
 
 namespace Moka::detail {
 namespace {
@@ -107,11 +108,16 @@ void GlDevice::DeleteDepthStencil(DeviceName depthStencil) { frameBuffers.Delete
 
 DeviceName GlDevice::CreateProgram(char const* vertexSource, char const* fragmentSource, char const* label,
                                    ProgramLayout* layout) {
-    GLuint const name = BuildGlProgram(vertexSource, fragmentSource, label, &layout->draws);
+    GlslStages sources{vertexSource, fragmentSource};
+    if (workarounds.Needs(GlWorkaround::AvoidMediump)) {
+        sources = {MakeGlslHighp(vertexSource), MakeGlslHighp(fragmentSource)};
+    }
+    GLuint const name =
+        BuildGlProgram(sources.vertex.c_str(), sources.fragment.c_str(), label, &layout->draws);
     if (!layout->draws) ++counters.errors;
     if (name == 0) return 0;
     debug.Label(GL_PROGRAM_KHR, name, label);
-    programs.Add(name, {vertexSource, fragmentSource}, label, layout);
+    programs.Add(name, std::move(sources), label, layout);
     return name;
 }
 

@@ -53,7 +53,7 @@ public:
     GlDebug debug;
     GlHostState host{state};
     GlFrameBuffers frameBuffers{state, host, debug};
-    GlPrograms programs{state, debug, workarounds};
+    GlPrograms programs{state, debug};
     GlSamplers samplers{state};
     GlVertexFormats vertexFormats{state};
     GlMergedRuns mergedRuns{*this};

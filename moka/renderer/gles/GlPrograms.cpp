@@ -4,7 +4,6 @@
 #include "moka/renderer/device/Counters.h"
 #include "moka/renderer/gles/GlState.h"
 #include "moka/renderer/gles/GlTables.h"
-#include "moka/renderer/gles/GlWorkarounds.h"
 
 #include <cstring>
 #include <utility>
@@ -23,8 +22,7 @@ void GlPrograms::Add(GLuint name, GlslStages sources, char const* label, Program
     *layout = program.layout;
     if (!layout->draws) return;
     program.variants =
-        std::make_unique<GlVariants>(mState, mDebug, mWorkarounds.Needs(GlWorkaround::AvoidMediump), label,
-                                     std::move(sources), program.layout);
+        std::make_unique<GlVariants>(mState, mDebug, label, std::move(sources), program.layout);
 }
 
 void GlPrograms::AddUniform(GLuint name, GLuint index, char const* label, Program& program) {

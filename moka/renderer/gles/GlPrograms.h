@@ -13,12 +13,10 @@
 namespace Moka::detail {
 
 class GlState;
-class GlWorkarounds;
 
 class GlPrograms {
 public:
-    GlPrograms(GlState& state, GlDebug const& debug, GlWorkarounds const& workarounds)
-        : mState(state), mDebug(debug), mWorkarounds(workarounds) {}
+    GlPrograms(GlState& state, GlDebug const& debug) : mState(state), mDebug(debug) {}
 
     // Reads the program's uniforms. Those of types that no parameter has are logged by name and left out.
     void Add(GLuint program, GlslStages sources, char const* label, ProgramLayout* layout);
@@ -43,7 +41,6 @@ private:
 
     GlState& mState;
     GlDebug const& mDebug;
-    GlWorkarounds const& mWorkarounds;
     std::unordered_map<GLuint, Program> mPrograms;
     // The program applied last, which the next draw uses as well in most cases.
     GLuint mLastName = 0;

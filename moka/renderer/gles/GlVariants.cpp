@@ -29,14 +29,9 @@ std::int32_t ReadInteger(ProgramLayout const& layout, unsigned char const* value
 
 } // namespace
 
-GlVariants::GlVariants(GlState& state, GlDebug const& debug, bool isHighp, char const* label,
-                       GlslStages sources, ProgramLayout const& layout)
-    : mState(state),
-      mDebug(debug),
-      mIsHighp(isHighp),
-      mLabel(label),
-      mSources(std::move(sources)),
-      mLayout(layout) {}
+GlVariants::GlVariants(GlState& state, GlDebug const& debug, char const* label, GlslStages sources,
+                       ProgramLayout const& layout)
+    : mState(state), mDebug(debug), mLabel(label), mSources(std::move(sources)), mLayout(layout) {}
 
 GlVariants::~GlVariants() {
     for (Variant const& variant : mVariants) {
@@ -89,7 +84,7 @@ std::size_t GlVariants::Find(std::uint32_t varying, unsigned char const* values)
 void GlVariants::Link(Variant& variant) {
     std::string reason;
     std::optional<GlslStages> const stages =
-        MakeGlslVariant({mSources, mLayout, variant.varying, variant.integers, mIsHighp}, &reason);
+        MakeGlslVariant({mSources, mLayout, variant.varying, variant.integers}, &reason);
     if (!stages) {
         Refuse(reason);
         return;

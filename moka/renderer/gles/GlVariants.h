@@ -22,7 +22,7 @@ public:
     // The uniform buffer binding that variants read; the last one that every device has.
     static constexpr GLuint kBinding = 23;
 
-    GlVariants(GlState& state, GlDebug const& debug, bool isHighp, char const* label, GlslStages sources,
+    GlVariants(GlState& state, GlDebug const& debug, char const* label, GlslStages sources,
                ProgramLayout const& layout);
     ~GlVariants();
     GlVariants(GlVariants const&) = delete;
@@ -55,7 +55,6 @@ private:
 
     GlState& mState;
     GlDebug const& mDebug;
-    bool const mIsHighp; // all precisions are
     std::string const mLabel;
     GlslStages const mSources;
     ProgramLayout const mLayout;

@@ -29,7 +29,7 @@ constexpr Row kTable[] = {
      "glFinish goes before the copy"},
     // Measured with lines of 64 px: 28 us of mediump, 13 of highp.
     {"llvmpipe", GlWorkaround::AvoidMediump,
-     "mediump values are converted around each operation, which is slow", "variants of programs are highp"},
+     "mediump values are converted around each operation, which is slow", "programs are built with highp"},
 };
 
 } // namespace

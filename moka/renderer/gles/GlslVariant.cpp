@@ -104,8 +104,8 @@ std::vector<Field> ListFields(GlslVariantRequest const& request) {
 // One stage, rewritten token by token. Lines keep their numbers.
 class StageRewriter {
 public:
-    StageRewriter(std::string_view source, bool isVertex, bool isHighp, std::vector<Field> const& fields)
-        : mTokens(SplitGlsl(source)), mIsVertex(isVertex), mIsHighp(isHighp), mFields(fields) {}
+    StageRewriter(std::string_view source, bool isVertex, std::vector<Field> const& fields)
+        : mTokens(SplitGlsl(source)), mIsVertex(isVertex), mFields(fields) {}
 
     void Rewrite() {
         for (mAt = 0; mAt < mTokens.size();) TakeToken();
@@ -184,9 +184,7 @@ private:
         }
         if (mDepth == 0) CountVarying(word);
         mStartsStatement = false;
-        if (mIsHighp && IsPrecision(word)) {
-            mBody += "highp";
-        } else if (word == "main") {
+        if (word == "main") {
             mHasMain = mHasMain || mDepth == 0;
             mBody += "mokaMain";
         } else if (mIsOld && word == "varying") {
@@ -227,7 +225,7 @@ private:
         std::string_view word = NextWord();
         std::string precision;
         if (IsPrecision(word)) {
-            precision = mIsHighp ? "highp " : std::string(word) + " ";
+            precision = std::string(word) + " ";
             word = NextWord();
         }
         std::string const type(word);
@@ -274,7 +272,6 @@ private:
 
     std::vector<GlslToken> const mTokens;
     bool const mIsVertex;
-    bool const mIsHighp;
     std::vector<Field> const& mFields;
     std::size_t mAt = 0;
     std::string mBody;
@@ -315,13 +312,10 @@ std::string MakeVertexStage(StageRewriter const& stage, StageRewriter const& fra
     return text + "#line 1\n" + stage.GetBody() + "\nvoid main() {\n" + copies + "    mokaMain();\n}\n";
 }
 
-std::string MakeFragmentStage(StageRewriter const& stage, bool isHighp) {
+std::string MakeFragmentStage(StageRewriter const& stage) {
     std::string text = "#version 300 es\n" + stage.GetExtensions();
     // As precise as gl_FragColor.
-    if (stage.WritesFragColor()) {
-        text += std::string("layout(location = 0) out ") + (isHighp ? "highp" : "mediump") +
-                " vec4 mokaFragColor;\n";
-    }
+    if (stage.WritesFragColor()) text += "layout(location = 0) out mediump vec4 mokaFragColor;\n";
     text += "#line 1\n" + stage.GetBody() + "\nvoid main() {\n";
     for (Field const* field : stage.GetUsed()) text += Assign(*field, "moka_" + field->uniform->name);
     return text + "    mokaMain();\n}\n";
@@ -343,8 +337,8 @@ GlslStages Rewrite(GlslVariantRequest const& request) {
     std::vector<Field> const fields = ListFields(request);
     if (fields.empty()) Refuse("it has no uniforms");
     if (GetRecordsPerBlock(request.layout) == 0) Refuse("its uniforms are too large for a block");
-    StageRewriter vertex(request.sources.vertex, true, request.isHighp, fields);
-    StageRewriter fragment(request.sources.fragment, false, request.isHighp, fields);
+    StageRewriter vertex(request.sources.vertex, true, fields);
+    StageRewriter fragment(request.sources.fragment, false, fields);
     vertex.Rewrite();
     fragment.Rewrite();
     CheckDeclared(fields, vertex, fragment);
@@ -353,11 +347,19 @@ GlslStages Rewrite(GlslVariantRequest const& request) {
         varyings += field->uniform->type == BindingTypeMatrix4 ? 4 : 1;
     }
     if (varyings > kMostVaryings) Refuse("it would need " + std::to_string(varyings) + " varyings");
-    return {MakeVertexStage(vertex, fragment, fields, request.layout),
-            MakeFragmentStage(fragment, request.isHighp)};
+    return {MakeVertexStage(vertex, fragment, fields, request.layout), MakeFragmentStage(fragment)};
 }
 
 } // namespace
+
+std::string MakeGlslHighp(std::string_view source) {
+    std::string text;
+    for (GlslToken const& token : SplitGlsl(source)) {
+        bool const isPrecision = token.kind == Kind::Word && IsPrecision(token.text);
+        text += isPrecision ? std::string_view("highp") : token.text;
+    }
+    return text;
+}
 
 std::size_t GetRecordStride(ProgramLayout const& layout) { return (layout.integersEnd + 15) / 16 * 16; }
 

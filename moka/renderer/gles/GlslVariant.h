@@ -14,6 +14,7 @@
 #include <cstdint>
 #include <optional>
 #include <string>
+#include <string_view>
 
 namespace Moka::detail {
 
@@ -36,8 +37,10 @@ struct GlslVariantRequest {
     std::uint32_t varying; // as Run has it
     // Of all ints and bools, in the order of their offsets. Those that do not vary become constants.
     std::vector<std::int32_t> const& integers;
-    bool isHighp; // lower precisions become highp
 };
+
+// The text with highp in place of lower precisions.
+std::string MakeGlslHighp(std::string_view source);
 
 // Bytes from one record to the next: std140 of the program's values up to the texture units.
 std::size_t GetRecordStride(ProgramLayout const& layout);

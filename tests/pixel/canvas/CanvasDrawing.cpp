@@ -96,6 +96,20 @@ RefPtr<IMKBitmap> MakeBitmap(Scenes::SceneStage& stage, TestImage const& image) 
     return RefPtr<IMKBitmap>::Adopt(stage.MakeBitmap(picture));
 }
 
+Drawing Twice(Drawing drawing) {
+    auto const draw = drawing.draw;
+    drawing.draw = [draw](IMKCanvas& canvas, Scenes::SceneStage& stage) {
+        Matrix3<float> const matrix = canvas.GetMatrix();
+        int const level = canvas.Save(IMKCanvasBase::SaveAll);
+        draw(canvas, stage);
+        canvas.Restore(level);
+        canvas.SetMatrix(matrix);
+        canvas.ClearAll(0);
+        draw(canvas, stage);
+    };
+    return drawing;
+}
+
 void CanvasDrawing::UseLargestSide(int side) { mSide = side; }
 
 RenderThread& CanvasDrawing::GetRenderThread() const { return *GetRenderer().Use(mSide); }

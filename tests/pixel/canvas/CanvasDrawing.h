@@ -42,6 +42,10 @@ TestImage MakeBackdrop(int width, int height);
 // On the drawing's own stage.
 RefPtr<IMKBitmap> MakeBitmap(Scenes::SceneStage& stage, TestImage const& image);
 
+// Draws everything, clears it, and draws it again: the renderer merges short runs of draws when it sees them for
+// the second time.
+Drawing Twice(Drawing drawing);
+
 class CanvasDrawing : public ::testing::Test {
 protected:
     static constexpr int kLarge = 4096;

@@ -46,9 +46,9 @@ INSTANTIATE_TEST_SUITE_P(All, SceneOnCpu,
                          ToTestName);
 
 TEST_P(SceneTest, IsTheSameOnEveryWay) {
-    Drawing const drawing = ToDrawing(GetScene());
+    Drawing const drawing = Twice(ToDrawing(GetScene()));
     TestImage const deferred = Draw(drawing);
-    // Draws that were merged run another program.
+    // Merged draws run another program.
     Slack const slack(deferred.width, deferred.height, 1);
     ExpectSame(deferred, Draw(drawing, Way::Immediate), GetParam() + " immediate", &slack);
     // What a scene makes of the GPU's own it makes through the queue.
