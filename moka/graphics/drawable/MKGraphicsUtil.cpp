@@ -2,7 +2,9 @@
 
 #include "moka/graphics/bitmap/IMKBitmapReadable.h"
 
+#include <array>
 #include <iterator>
+#include <utility>
 
 namespace Moka {
 namespace {
@@ -54,19 +56,33 @@ void SetWrap(IMKBitmapReadable* bitmap, TextureParamWrapping axis, MKPaint::Tile
     }
 }
 
-} // namespace
+constexpr int kModes = MKPaint::BlendingOff + 1;
 
-BlendStateDescriptor MKGraphicsUtil::GetBlendingStateDescriptor(MKPaint::XFermode mode) {
+BlendStateDescriptor MakeDescriptor(Factors const& factors) {
     BlendStateDescriptor descriptor(true);
-    if (mode == MKPaint::BlendingOff) {
-        descriptor.SetEnabled(false, true);
-        return descriptor;
-    }
-    bool const isKnown = mode >= 0 && mode < MKPaint::BlendingOff;
-    Factors const& factors = isKnown ? kFactors[mode] : kSrcOver;
     descriptor.SetColorEquation(BlendingFunction::Add, factors.source, factors.destination);
     descriptor.SetAlphaEquation(BlendingFunction::Add, factors.sourceAlpha, factors.destinationAlpha);
     return descriptor;
+}
+
+template <std::size_t... kMode>
+std::array<BlendStateDescriptor, kModes> MakeDescriptors(std::index_sequence<kMode...>) {
+    BlendStateDescriptor off(true);
+    off.SetEnabled(false, true);
+    return {MakeDescriptor(kFactors[kMode])..., off};
+}
+
+// Every draw needs one, so that they are made once.
+std::array<BlendStateDescriptor, kModes> MakeDescriptors() {
+    return MakeDescriptors(std::make_index_sequence<MKPaint::BlendingOff>());
+}
+
+} // namespace
+
+BlendStateDescriptor MKGraphicsUtil::GetBlendingStateDescriptor(MKPaint::XFermode mode) {
+    static std::array<BlendStateDescriptor, kModes> const descriptors = MakeDescriptors();
+    bool const isKnown = mode >= 0 && mode < kModes;
+    return descriptors[static_cast<std::size_t>(isKnown ? mode : MKPaint::SrcOver)];
 }
 
 void MKGraphicsUtil::SetTileModeRT(IMKBitmapReadable* bitmap, MKPaint const& paint) {

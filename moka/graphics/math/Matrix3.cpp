@@ -48,8 +48,13 @@ RectF MapCorners(T const* m, T left, T top, T right, T bottom) {
     T boxLeft = 0, boxTop = 0, boxRight = 0, boxBottom = 0;
     for (int i = 0; i < 4; ++i) {
         T const w = m[2] * xs[i] + m[5] * ys[i] + m[8];
-        T const x = (m[0] * xs[i] + m[3] * ys[i] + m[6]) / w;
-        T const y = (m[1] * xs[i] + m[4] * ys[i] + m[7]) / w;
+        T x = m[0] * xs[i] + m[3] * ys[i] + m[6];
+        T y = m[1] * xs[i] + m[4] * ys[i] + m[7];
+        // Dividing by 1 changes nothing, and takes time.
+        if (w != 1) {
+            x /= w;
+            y /= w;
+        }
         // Only a first corner that is not a number leaves its trace.
         if (i == 0 || x < boxLeft) boxLeft = x;
         if (i == 0 || x > boxRight) boxRight = x;

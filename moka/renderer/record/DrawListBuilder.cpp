@@ -49,11 +49,9 @@ void DrawListBuilder::AddDraw(RunState const& state, bool isKnownSame, ProgramSt
                         draw.count};
     OpenRun* const run = FindRun(stateIndex, draw.bounds);
     if (run && MayJoin(*run, program, record)) {
-        Join(*run, program, record);
-        run->bounds.Add(draw.bounds);
+        Join(*run, program, record, draw.bounds);
     } else {
-        OpenNewRun(stateIndex, record, vertices.stride);
-        mRuns[mRunCount - 1].bounds.Add(draw.bounds);
+        OpenNewRun(stateIndex, record, draw.bounds, vertices.stride);
     }
     mDrawnFloats = std::max(mDrawnFloats, vertices.offset + vertices.size);
 }
@@ -65,8 +63,8 @@ void DrawListBuilder::AddSeparateDraw(SeparateDraw const& draw) {
     UseTexture(draw.state.target.texture);
     mList.states.push_back(draw.state);
     OpenNewRun(mList.states.size() - 1,
-               {values, static_cast<int>(vertices.offset / vertices.stride), draw.count}, vertices.stride);
-    mRuns[mRunCount - 1].bounds.Add({});
+               {values, static_cast<int>(vertices.offset / vertices.stride), draw.count}, {},
+               vertices.stride);
     mDrawnFloats = vertices.offset + vertices.size;
 }
 
@@ -120,9 +118,17 @@ DrawListBuilder::OpenRun* DrawListBuilder::FindRun(std::size_t state, DrawBounds
         // Another target's texture may be sampled by what lies between.
         bool const hasOneTarget =
             mList.states[run.state].target.frameBuffer == mList.states[state].target.frameBuffer;
-        if (!hasOneTarget || run.bounds.MayTouch(bounds)) return nullptr;
+        if (!hasOneTarget || MayTouch(run, bounds)) return nullptr;
     }
     return nullptr;
+}
+
+// The draws since the last question are added first: most runs are never asked.
+bool DrawListBuilder::MayTouch(OpenRun& run, DrawBounds const& bounds) {
+    for (; run.unbounded != kEnd; run.unbounded = mDraws[run.unbounded].next) {
+        run.bounds.Add(mDraws[run.unbounded].bounds);
+    }
+    return run.bounds.MayTouch(bounds);
 }
 
 bool DrawListBuilder::MayJoin(OpenRun const& run, ProgramState const& program, Record const& record) const {
@@ -142,14 +148,18 @@ bool DrawListBuilder::MayJoin(OpenRun const& run, ProgramState const& program, R
                        &mList.uniforms[record.values] + layout.integersBegin, integers) == 0;
 }
 
-void DrawListBuilder::Join(OpenRun& run, ProgramState const& program, Record const& record) {
+void DrawListBuilder::Join(OpenRun& run, ProgramState const& program, Record const& record,
+                           DrawBounds const& bounds) {
     Record& last = mDraws[run.tail].record;
     bool const isNext = last.first + last.count == record.first;
     bool const isSame = last.values == record.values;
     if (isNext && isSame) {
         last.count += record.count;
+        mDraws[run.tail].bounds = Enclose(mDraws[run.tail].bounds, bounds);
+        run.unbounded = std::min(run.unbounded, run.tail);
     } else {
-        std::uint32_t const index = AddRecord(record);
+        std::uint32_t const index = AddRecord(record, bounds);
+        if (run.unbounded == kEnd) run.unbounded = index;
         if (!isSame) {
             unsigned char const* const values = mList.uniforms.data();
             Record const& before = mDraws[run.tail].record;
@@ -163,9 +173,10 @@ void DrawListBuilder::Join(OpenRun& run, ProgramState const& program, Record con
     run.vertices += record.count;
 }
 
-void DrawListBuilder::OpenNewRun(std::size_t state, Record const& record, std::size_t stride) {
+void DrawListBuilder::OpenNewRun(std::size_t state, Record const& record, DrawBounds const& bounds,
+                                 std::size_t stride) {
     RunEnd const end = GetEndBefore(state);
-    std::uint32_t const index = AddRecord(record);
+    std::uint32_t const index = AddRecord(record, bounds);
     if (mRuns.size() == mRunCount) mRuns.emplace_back();
     mList.commands.emplace_back(Run{state, 0, 0, true, 0});
     ++mCounters.runs;
@@ -180,12 +191,13 @@ void DrawListBuilder::OpenNewRun(std::size_t state, Record const& record, std::s
     run.isContiguous = true;
     run.varying = 0;
     run.bounds.Clear();
+    run.unbounded = index;
 }
 
-std::uint32_t DrawListBuilder::AddRecord(Record const& record) {
+std::uint32_t DrawListBuilder::AddRecord(Record const& record, DrawBounds const& bounds) {
     // Finish() needs no memory for them.
     if (mList.records.capacity() == mDraws.size()) mList.records.reserve(mDraws.size() * 2 + kReach);
-    mDraws.push_back({record, kEnd});
+    mDraws.push_back({record, bounds, kEnd});
     return static_cast<std::uint32_t>(mDraws.size() - 1);
 }
 

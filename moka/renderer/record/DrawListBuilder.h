@@ -115,6 +115,7 @@ private:
 
     struct Draw {
         Record record;
+        DrawBounds bounds;
         std::uint32_t next; // index of the run's next draw, or kEnd
     };
 
@@ -128,17 +129,19 @@ private:
         int vertices;
         bool isContiguous;
         std::uint32_t varying;
-        RunBounds bounds;
+        RunBounds bounds;        // of the draws up to the one before
+        std::uint32_t unbounded; // the first draw that is not in bounds yet, or kEnd
     };
 
     bool IsUndrawnEnd(ListVertices const& vertices) const;
     std::size_t AddState(RunState const& state, bool isKnownSame);
     std::size_t AddValues(ProgramState& program);
     OpenRun* FindRun(std::size_t state, DrawBounds const& bounds);
+    bool MayTouch(OpenRun& run, DrawBounds const& bounds);
     bool MayJoin(OpenRun const& run, ProgramState const& program, Record const& record) const;
-    void Join(OpenRun& run, ProgramState const& program, Record const& record);
-    void OpenNewRun(std::size_t state, Record const& record, std::size_t stride);
-    std::uint32_t AddRecord(Record const& record);
+    void Join(OpenRun& run, ProgramState const& program, Record const& record, DrawBounds const& bounds);
+    void OpenNewRun(std::size_t state, Record const& record, DrawBounds const& bounds, std::size_t stride);
+    std::uint32_t AddRecord(Record const& record, DrawBounds const& bounds);
     RunEnd GetEndBefore(std::size_t state) const;
     void FinishRun(OpenRun const& run);
     void Gather(OpenRun const& run, Run& finished);

@@ -55,14 +55,12 @@ public:
     Listed listed;
 
 private:
-    static constexpr std::size_t kNoUniform = ~std::size_t{0};
-
     struct Handle {
         std::string name;
-        std::size_t uniform; // index into the layout, which a driver orders as it likes
+        ProgramLayout::Uniform const* uniform; // of the layout, which a driver orders as it likes; or null
     };
 
-    static std::size_t Find(ProgramLayout const& layout, std::string const& name);
+    static ProgramLayout::Uniform const* Find(ProgramLayout const& layout, std::string const& name);
     void CopyValues(ProgramLayout const& layout, std::vector<unsigned char>& values) const;
 
     std::shared_ptr<Recorder> mRecorder; // null before the first build

@@ -75,20 +75,22 @@ bool Recorder::Draw(GraphicsObject& object, int format, PrimitiveType primitive,
     }
     RunState& state = requested->Resolve(mActive ? mActive->GetRef() : GetCurrentTarget(), format, primitive);
     if (state.target.texture != 0 && program->GetSamplerCount() > 0) SampleCopyOfTarget(state);
-    if (!mFlushesAtOnce &&
-        mStencils.TakeDraw(state, *program,
-                           object.GetVertices() + static_cast<std::ptrdiff_t>(first) * object.GetStride(),
-                           count, object.GetStride())) {
-        requested->SetChanged(true);
-        object.TakeBackVertices();
-        return true;
-    }
-    mStencils.BeforeDraw(state, object.GetBounds());
+    if (mStencils.IsPending() && TakeForStencil(state, object, first, count)) return true;
+    BeforeDraw(state, object.GetBounds());
     // Only now: a flush on the way here takes vertices out of the list.
     list.AddDraw(state, !requested->IsChanged(), *program,
                  {object.PlaceVertices(), first, count, object.GetBounds()});
     requested->SetChanged(false);
     if (isHosts || mIsExternal || list.IsFull()) Flush();
+    return true;
+}
+
+bool Recorder::TakeForStencil(RunState const& state, GraphicsObject& object, int first, int count) {
+    int const stride = object.GetStride();
+    float const* const vertices = object.GetVertices() + static_cast<std::ptrdiff_t>(first) * stride;
+    if (!mStencils.TakeDraw(state, *requested->GetProgram(), vertices, count, stride)) return false;
+    requested->SetChanged(true);
+    object.TakeBackVertices();
     return true;
 }
 

@@ -74,7 +74,9 @@ public:
     }
     void AddStencilClear(DepthStencilClear const& clear);
     // Around draws that the list gets in another way: clears that are drawn.
-    void BeforeDraw(RunState const& state, DrawBounds const& bounds) { mStencils.BeforeDraw(state, bounds); }
+    void BeforeDraw(RunState const& state, DrawBounds const& bounds) {
+        if (state.depthStencil.IsStencil()) mStencils.BeforeDraw(state, bounds);
+    }
     void AfterDraw();
     // The contents of the buffer are lost.
     void ForgetStencil(DeviceName depthStencil) { mStencils.Forget(depthStencil); }
@@ -135,6 +137,7 @@ private:
     void Prepare();
     void Delete(Dropped const& dropped);
     void DeleteDropped();
+    bool TakeForStencil(RunState const& state, GraphicsObject& object, int first, int count);
     void SampleCopyOfTarget(RunState& state);
     void CommitStates();
 

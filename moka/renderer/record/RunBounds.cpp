@@ -10,14 +10,13 @@ bool Touch(DrawBounds const& a, DrawBounds const& b) {
     return a.left < b.right && b.left < a.right && a.bottom < b.top && b.bottom < a.top;
 }
 
-void Include(DrawBounds& all, DrawBounds const& box) {
-    all.left = std::min(all.left, box.left);
-    all.bottom = std::min(all.bottom, box.bottom);
-    all.right = std::max(all.right, box.right);
-    all.top = std::max(all.top, box.top);
-}
-
 } // namespace
+
+DrawBounds Enclose(DrawBounds const& a, DrawBounds const& b) {
+    if (!a.IsKnown() || !b.IsKnown()) return {};
+    return {std::min(a.left, b.left), std::min(a.bottom, b.bottom), std::max(a.right, b.right),
+            std::max(a.top, b.top)};
+}
 
 void RunBounds::Clear() {
     mIsKnown = true;
@@ -39,12 +38,12 @@ void RunBounds::AddKnown(DrawBounds const& box) {
     if (mBoxes.empty()) {
         mAll = box;
     } else {
-        Include(mAll, box);
+        mAll = Enclose(mAll, box);
     }
     if (mBoxes.size() % kGroup == 0) {
         mGroups.push_back(box);
     } else {
-        Include(mGroups.back(), box);
+        mGroups.back() = Enclose(mGroups.back(), box);
     }
     mBoxes.push_back(box);
 }

@@ -11,6 +11,9 @@
 
 namespace Moka::detail {
 
+// Unknown if one of them is.
+DrawBounds Enclose(DrawBounds const& a, DrawBounds const& b);
+
 class RunBounds {
 public:
     void Clear();

@@ -10,12 +10,8 @@
 namespace Moka::detail {
 namespace {
 
-bool TestsStencil(RunState const& state) {
-    return state.target.depthStencil != 0 && state.depthStencil.IsStencil();
-}
-
 bool WritesStencil(RunState const& state) {
-    return TestsStencil(state) && state.depthStencil.GetWriteMask() != 0;
+    return state.depthStencil.IsStencil() && state.depthStencil.GetWriteMask() != 0;
 }
 
 // The pixels from low to high, in normalized device coordinates, and one more on either side.
@@ -102,7 +98,7 @@ bool StencilPreparations::TakeDraw(RunState const& state, ProgramState const& pr
 }
 
 void StencilPreparations::BeforeDraw(RunState const& state, DrawBounds const& bounds) {
-    if (!TestsStencil(state)) return;
+    if (state.target.depthStencil == 0) return;
     DeviceName const buffer = state.target.depthStencil;
     if (WritesStencil(state)) {
         Finish();

@@ -25,7 +25,8 @@ public:
     bool TakeDraw(RunState const& state, ProgramState const& program, float const* vertices, int count,
                   int stride);
 
-    // Before a draw is recorded: the buffer holds what the draw tests. Throws bad_alloc.
+    bool IsPending() const { return mIsPending; }
+    // Before a draw that tests the stencil is recorded: the buffer holds what the draw tests. Throws bad_alloc.
     void BeforeDraw(RunState const& state, DrawBounds const& bounds);
     // Before the buffer is written in another way, or external GL may see it: what is kept is recorded.
     void Finish();
