@@ -58,6 +58,6 @@ set(symbols ${MOKA_BINARY_DIR}/debian/symbols)
 run(dpkg-gensymbols -p${CPACK_DEBIAN_MOKARUNTIME_PACKAGE_NAME} -v${CPACK_PACKAGE_VERSION} -P${stage}/MokaRuntime
   ${files} -O${symbols})
 file(STRINGS ${symbols} lines)
-list(FILTER lines EXCLUDE REGEX "^ _Z[A-Z]*K?S|^ _Z[A-Z]*N[A-Z]*S|^ _ZN[A-Z]*9__gnu_cxx")
+list(FILTER lines EXCLUDE REGEX "^ _Z(T[VIST]|GV)?Z?N?[KVRO]*(S[tabsiod]|9__gnu_cxx)")
 list(JOIN lines "\n" lines)
 file(WRITE ${symbols} "${lines}\n")

@@ -32,7 +32,7 @@
 
 namespace Moka {
 
-enum class UseFrom { RenderThread, AnyThread };
+enum class UseFrom { RenderThread, AnyThread }; // in the factory's order: without and with the queue
 
 // Transparent.
 inline RefPtr<IMKBitmap> NewBitmap(IGLMsgQueue& queue, int width, int height,
