@@ -16,11 +16,26 @@ set(CMAKE_POSITION_INDEPENDENT_CODE ON)
 set(CMAKE_CXX_VISIBILITY_PRESET hidden)
 set(CMAKE_VISIBILITY_INLINES_HIDDEN ON)
 
-# moka_library(NAME [SHARED|OBJECT|INTERFACE] OUTPUT name SOURCES ... HEADERS ... PUBLIC deps PRIVATE deps)
+# What keeps its binary interface has the same number: the minor version counts while the major one is 0.
+set(MOKA_SOVERSION ${PROJECT_VERSION_MAJOR})
+if(PROJECT_VERSION_MAJOR EQUAL 0)
+  string(APPEND MOKA_SOVERSION .${PROJECT_VERSION_MINOR})
+endif()
+set(MOKA_GENERATED_HEADERS ${PROJECT_BINARY_DIR}/include)
+configure_file(${PROJECT_SOURCE_DIR}/cmake/Version.h.in ${MOKA_GENERATED_HEADERS}/moka/base/Version.h @ONLY)
+
+# moka_library(NAME KIND [OUTPUT name] [EXPORT name] SOURCES ... HEADERS ... PUBLIC deps PRIVATE deps)
+# KIND is what add_library takes, or LIBRARY: shared, and static with BUILD_SHARED_LIBS=OFF. EXPORT is the name
+# that others link, as Moka::name: an alias here, and the installed target.
 # HEADERS is the one list of public headers: what is installed, and what the build compiles alone, each in a
 # translation unit of its own, so that a header which needs another one included first does not build.
 function(moka_library name kind)
-  cmake_parse_arguments(PARSE_ARGV 2 arg "" "OUTPUT" "SOURCES;HEADERS;PUBLIC;PRIVATE")
+  cmake_parse_arguments(PARSE_ARGV 2 arg "" "OUTPUT;EXPORT" "SOURCES;HEADERS;PUBLIC;PRIVATE")
+  if(kind STREQUAL "LIBRARY" AND BUILD_SHARED_LIBS)
+    set(kind SHARED)
+  elseif(kind STREQUAL "LIBRARY")
+    set(kind STATIC)
+  endif()
   add_library(${name} ${kind} ${arg_SOURCES})
   if(kind STREQUAL "SHARED")
     # Loadable where pages have 16 KB, as on new Android devices.
@@ -32,10 +47,12 @@ function(moka_library name kind)
   endif()
   if(arg_HEADERS)
     target_sources(${name} ${scope} FILE_SET HEADERS BASE_DIRS ${PROJECT_SOURCE_DIR} FILES ${arg_HEADERS})
-    set_target_properties(${name} PROPERTIES VERIFY_INTERFACE_HEADER_SETS ON)
+    set_target_properties(${name} PROPERTIES VERIFY_INTERFACE_HEADER_SETS ${PROJECT_IS_TOP_LEVEL})
   endif()
   target_include_directories(${name} ${scope}
-    $<BUILD_INTERFACE:${PROJECT_SOURCE_DIR}> $<INSTALL_INTERFACE:${CMAKE_INSTALL_INCLUDEDIR}>)
+    "$<BUILD_INTERFACE:${PROJECT_SOURCE_DIR};${MOKA_GENERATED_HEADERS}>"
+    $<INSTALL_INTERFACE:${CMAKE_INSTALL_INCLUDEDIR}>)
+  target_compile_features(${name} ${scope} cxx_std_17)
   target_link_libraries(${name} ${scope} ${arg_PUBLIC})
   if(NOT kind STREQUAL "INTERFACE")
     target_link_libraries(${name} PRIVATE $<BUILD_INTERFACE:moka_compile_options> ${arg_PRIVATE})
@@ -43,13 +60,13 @@ function(moka_library name kind)
   if(arg_OUTPUT)
     # Installed, the libraries find each other where they lie.
     set_target_properties(${name} PROPERTIES
-      OUTPUT_NAME ${arg_OUTPUT} VERSION ${PROJECT_VERSION} SOVERSION 0 INSTALL_RPATH "\$ORIGIN")
+      OUTPUT_NAME ${arg_OUTPUT} VERSION ${PROJECT_VERSION} SOVERSION ${MOKA_SOVERSION} INSTALL_RPATH "\$ORIGIN")
   endif()
-endfunction()
-
-# moka_install(NAME ...): these libraries and their public headers, in the tree they have here, for find_package.
-function(moka_install)
-  install(TARGETS ${ARGN} EXPORT MokaGraphicsTargets FILE_SET HEADERS DESTINATION ${CMAKE_INSTALL_INCLUDEDIR})
+  if(arg_EXPORT)
+    set_target_properties(${name} PROPERTIES EXPORT_NAME ${arg_EXPORT})
+    add_library(Moka::${arg_EXPORT} ALIAS ${name})
+    add_library(Moka::${name} ALIAS ${name}) # its earlier name
+  endif()
 endfunction()
 
 # moka_executable(NAME SOURCES ... LIBRARIES ...)

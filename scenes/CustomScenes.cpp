@@ -7,7 +7,7 @@
 #include "moka/graphics/drawable/MKGaussianBlurDrawable.h"
 #include "moka/graphics/drawable/MKNonPremultipliedColorDrawable.h"
 #include "moka/graphics/drawable/MKTextMaskBitmapDrawable.h"
-#include "moka/graphics/factory/MKGraphicsFactory.h"
+#include "moka/graphics/factory/BitmapsAndCanvases.h"
 #include "moka/graphics/paint/MKPaint.h"
 #include "scenes/Picture.h"
 #include "scenes/SceneError.h"
@@ -44,10 +44,8 @@ RefPtr<Drawable> MakeDrawable(Arguments&&... arguments) {
 // A bitmap of this size that holds what draw puts onto a canvas over it.
 template <class Draw>
 BitmapPtr DrawAside(SceneStage& stage, int width, int height, Draw const& draw) {
-    BitmapPtr target = BitmapPtr::Adopt(
-        MKGraphicsFactory::CreateBitmap(stage.GetQueue(), width, height, nullptr, false, 1, false));
-    auto const canvas =
-        RefPtr<IMKCanvas>::Adopt(MKGraphicsFactory::CreateCanvas(stage.GetQueue(), target.Get(), 1));
+    BitmapPtr target = NewBitmap(*stage.GetQueue(), width, height);
+    auto const canvas = NewCanvas(*stage.GetQueue(), target);
     if (!canvas) throw SceneError("there is no room for the scene's bitmaps");
     draw(*canvas);
     return target;

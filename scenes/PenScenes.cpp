@@ -1,9 +1,6 @@
 #include "scenes/PenScenes.h"
 
-#include "moka/base/RefPtr.h"
-#include "moka/graphics/canvas/IMKCanvas.h"
-#include "moka/graphics/canvas/IMKPenCanvas.h"
-#include "moka/graphics/factory/MKGraphicsFactory.h"
+#include "moka/graphics/factory/BitmapsAndCanvases.h"
 #include "moka/graphics/paint/MKPaint.h"
 #include "scenes/SceneError.h"
 #include "scenes/ScenePen.h"
@@ -65,8 +62,7 @@ void DrawPanel(Panel const& panel, SceneStage& stage, IMKPenCanvas& pen, SetClip
 }
 
 void DrawPenStroke(IMKCanvas& canvas, SceneStage& stage) {
-    auto const pen = RefPtr<IMKPenCanvas>::Adopt(
-        MKGraphicsFactory::CreatePenCanvas(stage.GetQueue(), canvas.GetBitmap(), 1));
+    auto const pen = NewPenCanvas(*stage.GetQueue(), canvas.GetBitmap());
     if (!pen) throw SceneError("there is no room for a pen canvas");
     DrawPanel({canvas, RectF(10, 10, 150, 130)}, stage, *pen, [&] { pen->PreTranslate(10, 0); });
     DrawPanel({canvas, RectF(190, 40, 290, 90)}, stage, *pen, [&] {

@@ -5,7 +5,7 @@
 #include "moka/graphics/bitmap/IMKSubBitmap.h"
 #include "moka/graphics/bitmap/IMKTextureBitmap.h"
 #include "moka/graphics/canvas/IMKCanvas.h"
-#include "moka/graphics/factory/MKGraphicsFactory.h"
+#include "moka/graphics/factory/BitmapsAndCanvases.h"
 #include "moka/graphics/task/IGLMsgQueue.h"
 #include "scenes/SceneError.h"
 
@@ -17,12 +17,10 @@ namespace Moka::Scenes {
 namespace {
 
 RefPtr<IMKBitmap> MakeTarget(Scene const& scene, IGLMsgQueue& queue) {
-    IMKBitmap* const target =
-        scene.onScreen
-            ? MKGraphicsFactory::CreateScreenBitmap(&queue, 0, 0, scene.width, scene.height, 1, 1)
-            : MKGraphicsFactory::CreateBitmap(&queue, scene.width, scene.height, nullptr, false, 1, false);
+    auto target = scene.onScreen ? NewScreenBitmap(queue, scene.width, scene.height)
+                                 : NewBitmap(queue, scene.width, scene.height);
     if (!target) throw SceneError(scene.name + ": there is no room for its picture");
-    return RefPtr<IMKBitmap>::Adopt(target);
+    return target;
 }
 
 // Strips are made on the render thread, which reports nothing: what has no texture now never gets one.
@@ -59,7 +57,7 @@ IMKBitmap* QueueStage::MakeBitmap(Picture const& picture) {
 Picture RenderScene(Scene const& scene, IGLMsgQueue& queue, ScenePen* pen) {
     RefPtr<IMKBitmap> const target = MakeTarget(scene, queue);
     CheckStrips(scene, *target, queue);
-    auto const canvas = RefPtr<IMKCanvas>::Adopt(MKGraphicsFactory::CreateCanvas(&queue, target.Get(), 1));
+    auto const canvas = NewCanvas(queue, target);
     if (!canvas) throw SceneError(scene.name + ": there is no room for a canvas");
     QueueStage stage(queue, pen);
     DrawScene(scene, *canvas, stage);

@@ -9,7 +9,7 @@
 #include "moka/base/String.h"
 #include "moka/graphics/bitmap/IMKBitmap.h"
 #include "moka/graphics/bitmap/IMKTextureBitmap.h"
-#include "moka/graphics/factory/MKGraphicsFactory.h"
+#include "moka/graphics/factory/BitmapsAndCanvases.h"
 #include "moka/host/RenderThread.h"
 
 #include <memory>
@@ -31,14 +31,12 @@ BitmapPtr Decode(ConversionRequest const& request, RenderThread& queue) {
     String const path = String::FromFileName(request.input.GetPath());
     ConversionOptions const& options = request.options;
     std::string reason;
-    std::unique_ptr<Bitmap> const decoded(
+    std::unique_ptr<Bitmap> decoded(
         options.width != 0 ? BitmapFactory::CreateBitmap(&path, options.width, options.height, &reason)
                            : BitmapFactory::CreateBitmapForGraphics(&path, &reason));
     if (!decoded) throw Failure(TellCannot("read", request.input.GetPath(), reason));
-    BitmapPtr bitmap = BitmapPtr::Adopt(MKGraphicsFactory::CreateBitmap(
-        &queue, decoded->GetWidth(), decoded->GetHeight(), decoded->GetBuffer(), true, 1, false));
+    BitmapPtr bitmap = NewBitmap(queue, std::move(decoded));
     if (!bitmap) throw Failure(request.input.GetName() + ": not enough memory to load it");
-    decoded->SetDeleteBuffer(false);
     return bitmap;
 }
 

@@ -5,6 +5,7 @@
 #include "apps/moka/Failure.h"
 #include "apps/moka/GalleryCommand.h"
 #include "apps/moka/InfoCommand.h"
+#include "moka/base/Version.h"
 #include "moka/base/log/AndroidLog.h"
 #include "moka/base/log/LogSink.h"
 

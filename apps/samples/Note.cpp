@@ -1,10 +1,7 @@
 #include "apps/samples/Note.h"
 
 #include "apps/samples/Hand.h"
-#include "moka/base/RefPtr.h"
-#include "moka/graphics/bitmap/MKGraphicsFactory.h"
-#include "moka/graphics/canvas/IMKCanvas.h"
-#include "moka/graphics/canvas/IMKPenCanvas.h"
+#include "moka/graphics/factory/BitmapsAndCanvases.h"
 #include "scenes/SceneError.h"
 #include "scenes/SceneFile.h"
 
@@ -84,8 +81,7 @@ Scenes::Scene MakeNote(std::string const& page) {
     scene.needsGpu = scene.needsPen = true;
     scene.draw = [drawPage = scene.draw](IMKCanvas& canvas, Scenes::SceneStage& stage) {
         drawPage(canvas, stage);
-        auto const pen = RefPtr<IMKPenCanvas>::Adopt(
-            MKGraphicsFactory::CreatePenCanvas(stage.GetQueue(), canvas.GetBitmap(), 1));
+        auto const pen = NewPenCanvas(*stage.GetQueue(), canvas.GetBitmap());
         if (!pen || !stage.GetPen()) throw Scenes::SceneError("there is no pen canvas");
         Hand hand(*stage.GetPen(), *pen);
         WriteText(hand);

@@ -1,7 +1,6 @@
 // Counts the calls of our own functions that one warm DrawRect makes on the render thread, up to the draw list.
 // Built by bench/calls/run, with every function instrumented. Prints "calls N" and, for each function entered,
 // its module, offset and calls, which the script turns into files.
-#include "moka/base/RefPtr.h"
 #include "moka/graphics/MokaGraphics.h"
 #include "moka/graphics/task/WorkerTask.h"
 #include "moka/host/RenderThread.h"
@@ -58,10 +57,8 @@ public:
     UNCOUNTED explicit Drawing(IGLMsgQueue* queue) : mQueue(queue) {}
 
     UNCOUNTED void Run() {
-        auto const bitmap = RefPtr<IMKBitmap>::Adopt(
-            MKGraphicsFactory::CreateBitmap(mQueue, 256, 256, nullptr, false, 0, false));
-        auto const canvas =
-            RefPtr<IMKCanvas>::Adopt(MKGraphicsFactory::CreateCanvas(mQueue, bitmap.Get(), 0));
+        auto const bitmap = NewBitmap(*mQueue, 256, 256, UseFrom::RenderThread);
+        auto const canvas = NewCanvas(*mQueue, bitmap, UseFrom::RenderThread);
         MKPaint paint;
         for (int i = 0; i < 10; ++i) canvas->DrawRect(RectF(1, 2, 30, 40), &paint);
         RectF const rect(3, 4, 50, 60);

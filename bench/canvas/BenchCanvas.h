@@ -2,10 +2,7 @@
 #pragma once
 
 #include "bench/canvas/Frame.h"
-#include "moka/base/RefPtr.h"
-#include "moka/graphics/bitmap/IMKBitmap.h"
-#include "moka/graphics/canvas/IMKCanvas.h"
-#include "moka/graphics/factory/MKGraphicsFactory.h"
+#include "moka/graphics/factory/BitmapsAndCanvases.h"
 #include "moka/graphics/paint/MKPaint.h"
 #include "moka/host/RenderThread.h"
 
@@ -18,15 +15,12 @@ constexpr int kWarmUpFrames = 3;
 enum class Colors { Same, Distinct };
 
 inline RefPtr<IMKBitmap> MakeBitmap(int width, int height) {
-    return RefPtr<IMKBitmap>::Adopt(
-        MKGraphicsFactory::CreateBitmap(&GetRenderThread(), width, height, nullptr, false, 1, false));
+    return NewBitmap(GetRenderThread(), width, height);
 }
 
 struct BenchCanvas {
     explicit BenchCanvas(int width = kSide, int height = kSide)
-        : bitmap(MakeBitmap(width, height)),
-          canvas(RefPtr<IMKCanvas>::Adopt(
-              MKGraphicsFactory::CreateCanvas(&GetRenderThread(), bitmap.Get(), 1))) {}
+        : bitmap(MakeBitmap(width, height)), canvas(NewCanvas(GetRenderThread(), bitmap)) {}
 
     RefPtr<IMKBitmap> const bitmap;
     RefPtr<IMKCanvas> const canvas;

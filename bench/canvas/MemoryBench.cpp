@@ -1,10 +1,7 @@
 // What a request takes up while it waits to be run: a hundred thousand of them, of each kind in a process of
 // its own, because task memory is kept and used again.
 // Counters: heap_mb and rss_mb hold what was posted, bytes is the heap's for each request.
-#include "moka/base/RefPtr.h"
-#include "moka/graphics/bitmap/IMKBitmap.h"
-#include "moka/graphics/canvas/IMKCanvas.h"
-#include "moka/graphics/factory/MKGraphicsFactory.h"
+#include "moka/graphics/factory/BitmapsAndCanvases.h"
 #include "moka/graphics/paint/MKPaint.h"
 #include "moka/host/TaskQueue.h"
 
@@ -61,13 +58,9 @@ using Request = void (*)(IMKCanvas&, IMKBitmap*, MKPaint const&);
 Usage PostAll(Request request) {
     // Nobody runs it, so everything posted stays.
     TaskQueue queue;
-    auto const makeBitmap = [&] {
-        return RefPtr<IMKBitmap>::Adopt(
-            MKGraphicsFactory::CreateBitmap(&queue, 64, 64, nullptr, false, 1, false));
-    };
-    RefPtr<IMKBitmap> const target = makeBitmap();
-    RefPtr<IMKBitmap> const bitmap = makeBitmap();
-    auto const canvas = RefPtr<IMKCanvas>::Adopt(MKGraphicsFactory::CreateCanvas(&queue, target.Get(), 1));
+    auto const target = NewBitmap(queue, 64, 64);
+    auto const bitmap = NewBitmap(queue, 64, 64);
+    auto const canvas = NewCanvas(queue, target);
     MKPaint const paint;
     Usage const before = GetUsage();
     for (int i = 0; i < kRequests; ++i) request(*canvas, bitmap.Get(), paint);

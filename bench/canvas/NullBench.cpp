@@ -1,6 +1,5 @@
 // Rectangles over the device without a driver: what the library itself costs on the render thread, recording
 // and flushing, and on the caller's thread.
-#include "moka/base/RefPtr.h"
 #include "moka/graphics/MokaGraphics.h"
 #include "moka/host/RenderThread.h"
 
@@ -24,12 +23,10 @@ RenderThread& GetQueue() {
 // atOnce: a canvas of the render thread, used there; otherwise one that posts, and the wait for it.
 void DrawRectangles(benchmark::State& state, bool atOnce, bool distinct) {
     RenderThread& queue = GetQueue();
-    int const useQueue = atOnce ? 0 : 1;
+    UseFrom const from = atOnce ? UseFrom::RenderThread : UseFrom::AnyThread;
     auto const measure = [&] {
-        auto const bitmap = RefPtr<IMKBitmap>::Adopt(
-            MKGraphicsFactory::CreateBitmap(&queue, 1024, 1024, nullptr, false, useQueue, false));
-        auto const canvas =
-            RefPtr<IMKCanvas>::Adopt(MKGraphicsFactory::CreateCanvas(&queue, bitmap.Get(), useQueue));
+        auto const bitmap = NewBitmap(queue, 1024, 1024, from);
+        auto const canvas = NewCanvas(queue, bitmap, from);
         MKPaint paint;
         for (auto _ : state) {
             for (int i = 0; i < kRectangles; ++i) {

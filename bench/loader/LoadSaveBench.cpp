@@ -9,7 +9,7 @@
 #include "moka/base/log/LogSink.h"
 #include "moka/graphics/bitmap/IMKBitmap.h"
 #include "moka/graphics/bitmap/ImageDecoding.h"
-#include "moka/graphics/factory/MKGraphicsFactory.h"
+#include "moka/graphics/factory/BitmapsAndCanvases.h"
 #include "moka/graphics/loader/MKBitmapLoader.h"
 #include "moka/graphics/loader/MKBitmapSaveManager.h"
 #include "moka/host/RenderThread.h"
@@ -111,13 +111,8 @@ void RunCodecs(Pictures const& pictures) {
 
 void RunPipeline(Pictures const& pictures) {
     for (int i = 0; i < kPictures; ++i) {
-        auto const bitmap =
-            RefPtr<IMKBitmap>::Adopt(MKGraphicsFactory::CreateBitmap(&Queue(), &pictures.GetInput(i), 1));
-        std::unique_ptr<unsigned char[]> const pixels(new unsigned char[std::size_t{kSide} * kSide * 4]);
-        bitmap->GetBitmapData(bitmap->GetBitmapRect(), pixels.get());
-        Bitmap copy;
-        copy.Construct(pixels.get(), kSide, kSide, kSide * 4, 1, false, false);
-        if (!BitmapFactory::SaveBitmap(&copy, &pictures.GetOutput(i), kQuality)) std::abort();
+        auto const bitmap = LoadBitmap(Queue(), pictures.GetInput(i).ToFileName());
+        if (!SaveBitmap(*bitmap, pictures.GetOutput(i).ToFileName(), kQuality)) std::abort();
     }
 }
 

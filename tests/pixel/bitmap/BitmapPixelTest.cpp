@@ -6,19 +6,21 @@
 #include "moka/graphics/bitmap/IMKBitmapWritable.h"
 #include "moka/graphics/bitmap/IMKSubBitmap.h"
 #include "moka/graphics/bitmap/IMKTextureBitmap.h"
-#include "moka/graphics/factory/MKGraphicsFactory.h"
+#include "moka/graphics/factory/BitmapsAndCanvases.h"
 #include "moka/host/RenderThread.h"
 #include "moka/renderer/IRendererDeviceCaps.h"
 #include "moka/renderer/RendererFactory.h"
 #include "tests/support/ImageCompare.h"
 #include "tests/support/LogCapture.h"
 #include "tests/support/NothingLeft.h"
+#include "tests/support/TestFiles.h"
 #include "tests/support/TestImages.h"
 
 #include <cstring>
 #include <gtest/gtest.h>
 #include <memory>
 #include <string>
+#include <utility>
 
 namespace Moka::Testing {
 namespace {
@@ -46,8 +48,7 @@ protected:
     }
 
     BitmapPtr Create(TestImage const& image) {
-        return BitmapPtr::Adopt(MKGraphicsFactory::CreateBitmap(queue.get(), image.width, image.height,
-                                                                image.pixels.data(), false, 1, false));
+        return NewBitmap(*queue, image.width, image.height, image.pixels.data());
     }
 
     static TestImage Read(BitmapPtr const& bitmap, Rect const& r) {
@@ -98,8 +99,7 @@ TEST_F(PixelBitmap, ReadsBlocksOverStripEdgesAndPartlyOutside) {
 }
 
 TEST_F(PixelBitmap, WithoutPixelsItIsTransparentAndUpdatesLandWhereTheyShould) {
-    auto const bitmap = BitmapPtr::Adopt(
-        MKGraphicsFactory::CreateBitmap(queue.get(), 32, kMaxSide + 8, nullptr, false, 1, false));
+    auto const bitmap = NewBitmap(*queue, 32, kMaxSide + 8);
     TestImage expected(32, kMaxSide + 8);
     ExpectSame(Read(bitmap), expected);
     TestImage const patch = MakeGradient(10, 6);
@@ -131,8 +131,7 @@ TEST_F(PixelBitmap, AShareSeesUpdatesWhoeverGoesFirstAndAStripsCloneDoesNot) {
 }
 
 TEST_F(PixelBitmap, ClearsReachEveryStripThroughTheRenderSide) {
-    auto const bitmap = BitmapPtr::Adopt(
-        MKGraphicsFactory::CreateBitmap(queue.get(), 8, 2 * kMaxSide, nullptr, false, 1, false));
+    auto const bitmap = NewBitmap(*queue, 8, 2 * kMaxSide);
     bitmap->GetBitmapCanvasAttachable()->AttachToCanvas();
     ASSERT_TRUE(queue->Call([&] {
         bitmap->GetBitmapWritable()->ActivateFrameBufferRT(false);
@@ -153,14 +152,36 @@ TEST_F(PixelBitmap, TheRenderThreadFlavourGivesTheSame) {
     TestImage direct(image.width, image.height);
     TestImage shared(image.width, image.height);
     ASSERT_TRUE(queue->Call([&] {
-        auto const bitmap = BitmapPtr::Adopt(MKGraphicsFactory::CreateBitmap(
-            queue.get(), image.width, image.height, image.pixels.data(), false, 0, false));
+        auto const bitmap =
+            NewBitmap(*queue, image.width, image.height, image.pixels.data(), UseFrom::RenderThread);
         bitmap->GetBitmapData(bitmap->GetBitmapRect(), direct.pixels.data());
-        auto const share = BitmapPtr::Adopt(MKGraphicsFactory::CreateBitmap(queue.get(), bitmap.Get(), 0));
+        auto const share = NewSharedBitmap(*queue, bitmap, UseFrom::RenderThread);
         share->GetBitmapData(bitmap->GetBitmapRect(), shared.pixels.data());
     }));
     ExpectSame(direct, image);
     ExpectSame(shared, image);
+}
+
+TEST_F(PixelBitmap, ASavedBitmapIsLoadedWithEveryPixelAndAMissingFileSaysWhy) {
+    TempFolder const folder;
+    TestImage const image = MakeAlphaPattern(20, 2 * kMaxSide + 1);
+    std::string reason;
+    ASSERT_TRUE(SaveBitmap(*Create(image), folder.Path("picture.mki"), 100, &reason)) << reason;
+    ExpectSame(Read(LoadBitmap(*queue, folder.Path("picture.mki"))), image);
+
+    EXPECT_FALSE(SaveBitmap(*Create(image), folder.Path("picture.bmp"), 100, &reason));
+    EXPECT_NE(reason.find("unknown extension 'bmp'"), std::string::npos) << reason;
+    EXPECT_FALSE(LoadBitmap(*queue, folder.Path("missing.png"), &reason));
+    EXPECT_NE(reason.find("No such file"), std::string::npos) << reason;
+    log.Clear();
+}
+
+TEST_F(PixelBitmap, RowsThatAreNotTightlyPackedArriveWithoutTheirGaps) {
+    TestImage image = MakeGradient(20, 10);
+    auto wide = std::make_unique<Bitmap>(); // its left part, which it does not own
+    ASSERT_TRUE(wide->Construct(image.pixels.data(), 16, 10, image.GetStride(), Bitmap::kFormatRgba8888,
+                                false, false));
+    ExpectSame(Read(NewBitmap(*queue, std::move(wide))), image.Crop(0, 0, 16, 10));
 }
 
 TEST_F(PixelBitmap, AWidthOverTheLimitIsReportedAndInert) {

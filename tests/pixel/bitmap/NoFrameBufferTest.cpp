@@ -5,7 +5,7 @@
 #include "moka/graphics/bitmap/IMKSubBitmap.h"
 #include "moka/graphics/bitmap/IMKTextureBitmap.h"
 #include "moka/graphics/drawable/MKNonPremultipliedColorDrawable.h"
-#include "moka/graphics/factory/MKGraphicsFactory.h"
+#include "moka/graphics/factory/BitmapsAndCanvases.h"
 #include "moka/host/RenderThread.h"
 #include "moka/renderer/IRenderTarget.h"
 #include "moka/renderer/RendererFactory.h"
@@ -76,11 +76,7 @@ protected:
     }
 
     BitmapPtr Create(int width, int height, void const* pixels = nullptr) {
-        return BitmapPtr::Adopt(
-            MKGraphicsFactory::CreateBitmap(queue.get(), width, height, pixels, false, 1, false));
-    }
-    CanvasPtr NewCanvas(BitmapPtr const& bitmap, int useQueue = 1) {
-        return CanvasPtr::Adopt(MKGraphicsFactory::CreateCanvas(queue.get(), bitmap.Get(), useQueue));
+        return NewBitmap(*queue, width, height, pixels);
     }
 
     TestImage ReadWindow() {
@@ -104,7 +100,7 @@ protected:
 
 TEST_F(NoFrameBuffer, OfABitmapThatIsTooWideNothingIsDrawnAndOneErrorTellsOfIt) {
     BitmapPtr const bitmap = Create(kSide + 1, kSide);
-    DrawEverything(*NewCanvas(bitmap), source.Get(), custom.Get());
+    DrawEverything(*NewCanvas(*queue, bitmap), source.Get(), custom.Get());
     ExpectWindowUntouched("too wide");
     EXPECT_EQ(log.Count(ANDROID_LOG_ERROR), 1);
     EXPECT_EQ(log.Count(ANDROID_LOG_ERROR, "65 x 64 is refused"), 1);
@@ -116,7 +112,7 @@ TEST_F(NoFrameBuffer, OfABitmapWhoseTaskWasRefusedNothingIsDrawn) {
         if (texture) queue->Refuse(1);
         BitmapPtr const bitmap = Create(kSide, kSide);
         if (!texture) queue->Refuse(1);
-        DrawEverything(*NewCanvas(bitmap), source.Get(), custom.Get());
+        DrawEverything(*NewCanvas(*queue, bitmap), source.Get(), custom.Get());
         ExpectWindowUntouched(texture ? "no texture" : "no frame buffer");
         bitmap->GetTextureBitmap()->GetSubBitmap(0)->Unref(); // the reference of the refused task
     }
@@ -125,7 +121,7 @@ TEST_F(NoFrameBuffer, OfABitmapWhoseTaskWasRefusedNothingIsDrawn) {
 TEST_F(NoFrameBuffer, OfABitmapThatIsYetToBeCreatedNothingIsDrawn) {
     thread->Call([this] {
         BitmapPtr const bitmap = Create(kSide, kSide);
-        DrawEverything(*NewCanvas(bitmap, 0), source.Get(), custom.Get());
+        DrawEverything(*NewCanvas(*queue, bitmap, UseFrom::RenderThread), source.Get(), custom.Get());
     });
     ExpectWindowUntouched("too early");
 }

@@ -1,6 +1,6 @@
 // Input that makes no sense: nothing crashes, no GL error, and the next draw is right. And input that the
 // caller changes at once: it has been copied.
-#include "moka/graphics/factory/MKGraphicsFactory.h"
+#include "moka/graphics/factory/BitmapsAndCanvases.h"
 #include "moka/graphics/task/ITask.h"
 #include "tests/pixel/canvas/CanvasDrawing.h"
 
@@ -236,10 +236,9 @@ TEST_F(BadInputTest, ARefusedDrawLeavesTheOthersRight) {
     };
     // The canvas comes first: clipping, then three rectangles.
     for (int refused = 2; refused <= 4; ++refused) {
-        auto const target = RefPtr<IMKBitmap>::Adopt(MKGraphicsFactory::CreateBitmap(
-            &GetRenderThread(), 40, 40, start.pixels.data(), false, 1, false));
+        auto const target = NewBitmap(GetRenderThread(), 40, 40, start.pixels.data());
         ForgetfulQueue queue(GetRenderThread(), refused);
-        auto canvas = RefPtr<IMKCanvas>::Adopt(MKGraphicsFactory::CreateCanvas(&queue, target.Get(), 1));
+        auto canvas = NewCanvas(queue, target);
         for (int i = 0; i < 3; ++i) drawRect(*canvas, i);
         canvas = {};
         EXPECT_EQ(queue.GetOffered(), 5); // the last one deletes

@@ -1,7 +1,7 @@
 #include "tests/pixel/canvas/CanvasDrawing.h"
 
 #include "moka/base/log/AndroidLog.h"
-#include "moka/graphics/factory/MKGraphicsFactory.h"
+#include "moka/graphics/factory/BitmapsAndCanvases.h"
 #include "moka/renderer/RendererFactory.h"
 #include "tests/support/NothingLeft.h"
 #include "tests/support/reference/ReferenceStage.h"
@@ -65,13 +65,12 @@ private:
 
 TestImage DrawOnGpu(Drawing const& drawing, IGLMsgQueue& queue, bool onRenderThread) {
     TestImage const& start = drawing.start;
-    int const useQueue = onRenderThread ? 0 : 1;
-    auto const bitmap = BitmapPtr::Adopt(MKGraphicsFactory::CreateBitmap(
-        &queue, start.width, start.height, start.pixels.data(), false, useQueue, false));
+    UseFrom const from = onRenderThread ? UseFrom::RenderThread : UseFrom::AnyThread;
+    auto const bitmap = NewBitmap(queue, start.width, start.height, start.pixels.data(), from);
     TestImage picture(start.width, start.height);
     if (!bitmap) return picture;
     {
-        auto const canvas = CanvasPtr::Adopt(MKGraphicsFactory::CreateCanvas(&queue, bitmap.Get(), useQueue));
+        auto const canvas = NewCanvas(queue, bitmap, from);
         GpuStage stage(queue, onRenderThread);
         drawing.draw(*canvas, stage);
     }

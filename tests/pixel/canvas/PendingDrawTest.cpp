@@ -4,7 +4,7 @@
 
 #include "moka/graphics/bitmap/IMKSubBitmap.h"
 #include "moka/graphics/bitmap/IMKTextureBitmap.h"
-#include "moka/graphics/factory/MKGraphicsFactory.h"
+#include "moka/graphics/factory/BitmapsAndCanvases.h"
 
 #include <cstdlib>
 #include <functional>
@@ -34,10 +34,8 @@ protected:
 
     Drawn Make() {
         RenderThread& queue = GetRenderThread();
-        auto bitmap = RefPtr<IMKBitmap>::Adopt(
-            MKGraphicsFactory::CreateBitmap(&queue, kSide, kSide, nullptr, false, 1, false));
-        auto canvas = RefPtr<IMKCanvas>::Adopt(MKGraphicsFactory::CreateCanvas(&queue, bitmap.Get(), 1));
-        return {bitmap, canvas};
+        auto bitmap = NewBitmap(queue, kSide, kSide);
+        return {bitmap, NewCanvas(queue, bitmap)};
     }
 
     static void Fill(Drawn const& drawn, Color const& color) {
@@ -91,8 +89,7 @@ TEST_F(PendingDrawTest, TheDestinationsCopyForDarkenWaits) {
     EXPECT_EQ(CountWrong([&](Drawn const& drawn) {
                   MKPaint darken;
                   darken.SetXFermode(MKPaint::Darken);
-                  auto const canvas = RefPtr<IMKCanvas>::Adopt(
-                      MKGraphicsFactory::CreateCanvas(&GetRenderThread(), drawn.bitmap.Get(), 1));
+                  auto const canvas = NewCanvas(GetRenderThread(), drawn.bitmap);
                   canvas->DrawBitmap(white.bitmap.Get(), 0, 0, &darken);
                   return Read(*drawn.bitmap);
               }),

@@ -52,7 +52,7 @@ public:
         int const rows = (static_cast<int>(mCells.size()) + kColumns - 1) / kColumns;
         TestImage image(kColumns * kCell, rows * kCell);
         mHolders.target = NewBitmap(image.width, image.height, nullptr);
-        mHolders.canvas = CanvasPtr::Adopt(MKGraphicsFactory::CreateCanvas(mQueue, mHolders.target.Get(), 1));
+        mHolders.canvas = Moka::NewCanvas(*mQueue, mHolders.target);
         for (std::size_t i = 0; i < mCells.size(); ++i) {
             auto const [x, y] = Place(static_cast<int>(i));
             mHolders.canvas->Save(IMKCanvasBase::SaveAll);
@@ -84,8 +84,7 @@ private:
     static std::pair<int, int> Place(int cell) { return {cell % kColumns * kCell, cell / kColumns * kCell}; }
 
     BitmapPtr NewBitmap(int width, int height, void const* pixels) {
-        return BitmapPtr::Adopt(
-            MKGraphicsFactory::CreateBitmap(mQueue, width, height, pixels, false, 1, false));
+        return Moka::NewBitmap(*mQueue, width, height, pixels);
     }
 
     void AddShapes() {

@@ -45,9 +45,7 @@ TEST_F(WindowTest, WhatIsDrawnOnAScreenBitmapIsShownWhenPresented) {
         GTEST_SKIP() << "the ANGLE that the tests fetch is built without a window system";
     }
     EXPECT_NE(thread->GetContextInfo().path.find("window"), std::string::npos);
-    IMKBitmap* const screen =
-        MKGraphicsFactory::CreateScreenBitmap(thread.get(), 0, 0, kWidth, kHeight, 1, 1);
-    IMKCanvas* const canvas = MKGraphicsFactory::CreateCanvas(thread.get(), screen, 1);
+    auto canvas = NewCanvas(*thread, NewScreenBitmap(*thread, kWidth, kHeight));
     canvas->ClearAll(static_cast<int>(0xFF0000FF));
     MKPaint paint;
     paint.SetColor(static_cast<int>(0xFFFF0000));
@@ -62,8 +60,7 @@ TEST_F(WindowTest, WhatIsDrawnOnAScreenBitmapIsShownWhenPresented) {
     EXPECT_EQ(window->GetPixel(5, 5), 0xFF0000u); // drawn, not presented
     EXPECT_TRUE(thread->Present());
     EXPECT_TRUE(ShowsSoon(5, 5, 0x00FF00));
-    MKGraphicsFactory::ReleaseCanvas(canvas);
-    MKGraphicsFactory::ReleaseBitmap(screen);
+    canvas = {};
     thread->Stop();
     EXPECT_FALSE(thread->Present());
 }

@@ -6,7 +6,7 @@
 #include "moka/graphics/bitmap/IMKBitmapWritable.h"
 #include "moka/graphics/canvas/IMKCanvas.h"
 #include "moka/graphics/canvas/IMKPenCanvas.h"
-#include "moka/graphics/factory/MKGraphicsFactory.h"
+#include "moka/graphics/factory/BitmapsAndCanvases.h"
 #include "moka/graphics/paint/MKPaint.h"
 #include "moka/host/RenderThread.h"
 #include "moka/renderer/RendererFactory.h"
@@ -59,8 +59,8 @@ protected:
             ink = std::make_unique<ForeignInk>();
         });
         bitmap = Create(Paper());
-        pen = RefPtr<IMKPenCanvas>::Adopt(MKGraphicsFactory::CreatePenCanvas(queue.get(), bitmap.Get(), 1));
-        canvas = RefPtr<IMKCanvas>::Adopt(MKGraphicsFactory::CreateCanvas(queue.get(), bitmap.Get(), 1));
+        pen = NewPenCanvas(*queue, bitmap);
+        canvas = NewCanvas(*queue, bitmap);
     }
 
     // Nothing alive on the GPU, and no driver message of error severity.
@@ -80,8 +80,7 @@ protected:
     }
 
     BitmapPtr Create(TestImage const& image) {
-        auto created = BitmapPtr::Adopt(MKGraphicsFactory::CreateBitmap(
-            queue.get(), image.width, image.height, image.pixels.data(), false, 1, false));
+        auto created = NewBitmap(*queue, image.width, image.height, image.pixels.data());
         queue->WaitForTasks(); // the image may go
         return created;
     }

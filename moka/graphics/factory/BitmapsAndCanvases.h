@@ -1,0 +1,140 @@
+// BitmapsAndCanvases: named functions over MKGraphicsFactory, whose results count their references themselves.
+//     auto bitmap = NewBitmap(*queue, 400, 400);
+//     auto canvas = NewCanvas(*queue, bitmap);
+//     canvas->DrawCircle(200, 200, 100, nullptr);
+//     SaveBitmap(*bitmap, "circle.png");
+// Owner:  the returned pointer holds the first reference; copies of it hold more. Pixels are copied, or taken
+//         over where the parameter says so.
+// Thread: UseFrom says where the result will be used. For AnyThread any thread may call, and the work is posted
+//         to queue. For RenderThread only queue's render thread may. ReadBitmap and SaveBitmap wait for the
+//         render thread, so a task must not call them with a bitmap for AnyThread.
+// Units:  pixels; RGBA8, premultiplied. Paths are the bytes of a file's name.
+// Fails:  with a null pointer or false, and one error line, as MKGraphicsFactory and BitmapFactory do. A null
+//         bitmap gives a null canvas.
+#pragma once
+
+#include "moka/base/Bitmap.h"
+#include "moka/base/BitmapFactory.h"
+#include "moka/base/Rect.h"
+#include "moka/base/RefPtr.h"
+#include "moka/base/String.h"
+#include "moka/graphics/bitmap/IMKBitmap.h"
+#include "moka/graphics/canvas/IMKCanvas.h"
+#include "moka/graphics/canvas/IMKPenCanvas.h"
+#include "moka/graphics/factory/MKGraphicsFactory.h"
+#include "moka/graphics/task/IGLMsgQueue.h"
+
+#include <cstddef>
+#include <memory>
+#include <new>
+#include <string>
+#include <utility>
+
+namespace Moka {
+
+enum class UseFrom { RenderThread, AnyThread }; // in the factory's order: without and with the queue
+
+// Transparent.
+inline RefPtr<IMKBitmap> NewBitmap(IGLMsgQueue& queue, int width, int height,
+                                   UseFrom from = UseFrom::AnyThread) {
+    return RefPtr<IMKBitmap>::Adopt(MKGraphicsFactory::CreateBitmap(&queue, width, height, nullptr, false,
+                                                                    static_cast<int>(from), false));
+}
+
+// From tightly packed pixels, which stay the caller's and valid until the render thread has uploaded them.
+inline RefPtr<IMKBitmap> NewBitmap(IGLMsgQueue& queue, int width, int height, void const* pixels,
+                                   UseFrom from = UseFrom::AnyThread) {
+    return RefPtr<IMKBitmap>::Adopt(
+        MKGraphicsFactory::CreateBitmap(&queue, width, height, pixels, false, static_cast<int>(from), false));
+}
+
+// From image, whose pixels it takes over. They are copied only if image does not own them, or if its rows are
+// not tightly packed. Null, without a message, when image is.
+inline RefPtr<IMKBitmap> NewBitmap(IGLMsgQueue& queue, std::unique_ptr<Bitmap> image,
+                                   UseFrom from = UseFrom::AnyThread) {
+    if (!image) return {};
+    if (!image->GetDeleteBuffer() || image->GetStride() != image->GetWidth() * 4) {
+        std::unique_ptr<Bitmap> copy(new (std::nothrow) Bitmap);
+        if (!copy || !copy->Construct(image->GetBuffer(), image->GetWidth(), image->GetHeight(),
+                                      image->GetStride(), image->GetFormat(), true, true))
+            return {};
+        image = std::move(copy);
+    }
+    auto bitmap = RefPtr<IMKBitmap>::Adopt(
+        MKGraphicsFactory::CreateBitmap(&queue, image->GetWidth(), image->GetHeight(), image->GetBuffer(),
+                                        true, static_cast<int>(from), false));
+    if (bitmap) image->SetDeleteBuffer(false);
+    return bitmap;
+}
+
+// Over the host's default frame buffer, for instance a window's.
+inline RefPtr<IMKBitmap> NewScreenBitmap(IGLMsgQueue& queue, int width, int height,
+                                         UseFrom from = UseFrom::AnyThread) {
+    return RefPtr<IMKBitmap>::Adopt(
+        MKGraphicsFactory::CreateScreenBitmap(&queue, 0, 0, width, height, 1, static_cast<int>(from)));
+}
+
+// Another bitmap over the same image, which it keeps alive.
+inline RefPtr<IMKBitmap> NewSharedBitmap(IGLMsgQueue& queue, RefPtr<IMKBitmap> const& parent,
+                                         UseFrom from = UseFrom::AnyThread) {
+    return RefPtr<IMKBitmap>::Adopt(
+        MKGraphicsFactory::CreateBitmap(&queue, parent.Get(), static_cast<int>(from)));
+}
+
+// The canvas keeps target alive.
+inline RefPtr<IMKCanvas> NewCanvas(IGLMsgQueue& queue, IMKBitmap* target, UseFrom from = UseFrom::AnyThread) {
+    return RefPtr<IMKCanvas>::Adopt(MKGraphicsFactory::CreateCanvas(&queue, target, static_cast<int>(from)));
+}
+inline RefPtr<IMKCanvas> NewCanvas(IGLMsgQueue& queue, RefPtr<IMKBitmap> const& target,
+                                   UseFrom from = UseFrom::AnyThread) {
+    return NewCanvas(queue, target.Get(), from);
+}
+
+inline RefPtr<IMKPenCanvas> NewPenCanvas(IGLMsgQueue& queue, IMKBitmap* target,
+                                         UseFrom from = UseFrom::AnyThread) {
+    return RefPtr<IMKPenCanvas>::Adopt(
+        MKGraphicsFactory::CreatePenCanvas(&queue, target, static_cast<int>(from)));
+}
+inline RefPtr<IMKPenCanvas> NewPenCanvas(IGLMsgQueue& queue, RefPtr<IMKBitmap> const& target,
+                                         UseFrom from = UseFrom::AnyThread) {
+    return NewPenCanvas(queue, target.Get(), from);
+}
+
+// From a PNG, JPEG, WebP or mki file, by the base library's codecs, on this thread and also where Java has
+// decoders. reason, if given, is filled with what is wrong with the file.
+inline RefPtr<IMKBitmap> LoadBitmap(IGLMsgQueue& queue, std::string const& path,
+                                    std::string* reason = nullptr, UseFrom from = UseFrom::AnyThread) {
+    String const name = String::FromFileName(path);
+    std::unique_ptr<Bitmap> image(BitmapFactory::CreateBitmapForGraphics(&name, reason));
+    return NewBitmap(queue, std::move(image), from);
+}
+
+// The bitmap's pixels, when everything that was posted before has been drawn. Transparent if the queue refuses.
+inline std::unique_ptr<Bitmap> ReadBitmap(IMKBitmap& bitmap) {
+    int const width = bitmap.GetWidth();
+    int const height = bitmap.GetHeight();
+    if (width < 1 || height < 1) return nullptr;
+    std::size_t const bytes = static_cast<std::size_t>(width) * static_cast<std::size_t>(height) * 4;
+    std::unique_ptr<unsigned char[]> pixels(new (std::nothrow) unsigned char[bytes]());
+    std::unique_ptr<Bitmap> image(new (std::nothrow) Bitmap);
+    if (!pixels || !image) return nullptr;
+    bitmap.GetBitmapData(bitmap.GetBitmapRect(), pixels.get());
+    if (image->Construct(pixels.get(), width, height, width * 4, Bitmap::kFormatRgba8888, false, true))
+        static_cast<void>(pixels.release());
+    return image;
+}
+
+// Into a file whose format its extension says; see BitmapFactory::SaveBitmap for quality. reason, if given, is
+// filled with why it could not be saved.
+inline bool SaveBitmap(IMKBitmap& bitmap, std::string const& path, int quality = 100,
+                       std::string* reason = nullptr) {
+    std::unique_ptr<Bitmap> const image = ReadBitmap(bitmap);
+    if (!image) {
+        if (reason) *reason = "not enough memory to read the bitmap back";
+        return false;
+    }
+    String const name = String::FromFileName(path);
+    return BitmapFactory::SaveBitmap(image.get(), &name, quality, reason);
+}
+
+} // namespace Moka
