@@ -39,6 +39,7 @@ struct Counters {
     Counter drawRequests;
     Counter draws;
     Counter flushes;
+    Counter flushedRequests; // of drawRequests, those before the last flush
     Counter listBytes;
 
     Counter frameBufferSwitches;

@@ -1,6 +1,7 @@
 #include "moka/renderer/record/Recorder.h"
 
 #include "moka/renderer/record/Caps.h"
+#include "moka/renderer/record/FlushTrace.h"
 #include "moka/renderer/record/GraphicsObject.h"
 #include "moka/renderer/record/ProgramState.h"
 #include "moka/renderer/record/RenderTarget.h"
@@ -113,6 +114,7 @@ void Recorder::AfterAdding() {
 
 void Recorder::Flush() {
     if (list.IsEmpty()) return;
+    FlushTrace const trace(counters);
     mDevice->Submit(list.GetList());
     ++counters.flushes;
     for (GraphicsObject* const holder : mHolders) holder->KeepVertices();

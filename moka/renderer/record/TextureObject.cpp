@@ -1,5 +1,6 @@
 #include "moka/renderer/record/TextureObject.h"
 
+#include "moka/base/Trace.h"
 #include "moka/base/log/AndroidLog.h"
 #include "moka/renderer/record/Observer.h"
 #include "moka/renderer/record/Recorder.h"
@@ -112,6 +113,7 @@ void TextureObject::Upload(Rect const& rect, void const* pixels, int stride) {
                                               std::int64_t{rect.bottom} - rect.top, GetWidth(), GetHeight());
     if (block.IsEmpty()) return;
     recorder.FlushIfUsed(mStorage->GetName());
+    TraceScope const trace("renderer", "Upload", "bytes", block.GetBytes());
     recorder.GetDevice().Upload(mStorage->GetName(), block, pixels, stride > 0 ? stride : tight);
     recorder.counters.bytesUploaded += block.GetBytes();
 }
