@@ -114,8 +114,8 @@ using BitmapPtr = RefPtr<IMKBitmap>;
 // Uploads 32 x 32, draws, reads back.
 void Work(RenderThread& queue, int rectangles) {
     std::vector<std::uint32_t> pixels(32 * 32);
-    auto const bitmap = BitmapPtr::Adopt(
-        MKGraphicsFactory::CreateBitmap(&queue, 32, 32, pixels.data(), false, 1, false));
+    auto const bitmap =
+        BitmapPtr::Adopt(MKGraphicsFactory::CreateBitmap(&queue, 32, 32, pixels.data(), false, 1, false));
     auto const canvas = RefPtr<IMKCanvas>::Adopt(MKGraphicsFactory::CreateCanvas(&queue, bitmap.Get(), 1));
     for (int i = 0; i < rectangles; ++i) canvas->DrawRect(0, 0, 8, 8, nullptr);
     canvas->ClearAll(0, 0, 0, 1);
