@@ -71,6 +71,7 @@ MKCanvasImplBase::MKCanvasImplBase(IGLMsgQueue* queue, IMKBitmap* bitmap, bool o
 MKCanvasImplBase::~MKCanvasImplBase() = default;
 
 void MKCanvasImplBase::createClippingRT() {
+    Trace::NameTask("createClippingRT");
     try {
         mClipping.reset(new (std::nothrow) MKCanvasClipping(GetBitmap()));
     } catch (std::bad_alloc const&) {
