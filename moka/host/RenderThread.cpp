@@ -108,7 +108,10 @@ struct RenderThread::Impl {
             return started.set_value("another RenderThread is running in this process; stop it first");
         }
         std::string error;
-        context = detail::HostContext::Open(options, &error);
+        {
+            TraceScope const opening("host", "open the context");
+            context = detail::HostContext::Open(options, &error);
+        }
         if (!context) return started.set_value(std::move(error));
         if (!RendererFactory::AttachContext(options.limits, context->GetLoader())) {
             error = "the renderer refused the context reached through " + context->GetPath() +
@@ -127,6 +130,7 @@ struct RenderThread::Impl {
 
     // On the render thread. What waits when the window goes is dropped.
     void Show() {
+        Trace::NameTask("Present");
         if (isWindowGone) return;
         TraceScope const frame("frame", "Present", "number", ++shown);
         RendererFactory::Flush();
