@@ -17,7 +17,7 @@ int status = 0;
 void Realize(GtkGLArea* area, gpointer) {
     gtk_gl_area_make_current(area);
     GError const* const error = gtk_gl_area_get_error(area);
-    if (!error && RendererFactory::AttachContext()) return;
+    if (!error && RendererFactory::AttachContext()) return RendererFactory::SetDeferred(true);
     g_printerr("no GLES context: %s\n", error ? error->message : "GTK's is not OpenGL ES 3.0");
     status = 1;
     g_application_quit(g_application_get_default());

@@ -21,6 +21,7 @@ protected:
     void initializeGL() override {
         mIsAttached = RendererFactory::AttachContext();
         if (!mIsAttached) return;
+        RendererFactory::SetDeferred(true); // this program flushes after each frame
         // Moved into another window, the widget gets another context.
         connect(context(), &QOpenGLContext::aboutToBeDestroyed, this, [this] { Detach(); });
     }
