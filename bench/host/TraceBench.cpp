@@ -47,7 +47,8 @@ public:
         MKPaint paint;
         for (int i = 0; i < 5000; ++i) {
             auto const x = static_cast<float>(i % 100 * 5);
-            auto const y = static_cast<float>(i / 100 * 10);
+            int const row = i / 100;
+            auto const y = static_cast<float>(row * 10);
             if (isColorful) paint.SetColor(static_cast<int>(0xFF000000u + static_cast<unsigned>(i) * 331));
             mCanvas->DrawRect(x, y, x + 4, y + 8, &paint);
         }
