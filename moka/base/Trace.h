@@ -61,6 +61,7 @@ private:
 /// An event from here to the end of the scope.
 class TraceScope {
 public:
+    // cppcheck-suppress uninitMemberVar ; only mIsOn is written while the trace is off
     TraceScope(char const* category, char const* name) noexcept : TraceScope(Trace::IsOn(), category, name) {}
     TraceScope(char const* category, char const* name, char const* key, std::uint64_t number) noexcept
         : TraceScope(category, name) {
@@ -78,6 +79,7 @@ public:
     void Set(char const* key, char const* text) noexcept { Append({key, 0, text}); }
 
 private:
+    // cppcheck-suppress uninitMemberVarPrivate ; only mIsOn is written while the trace is off
     TraceScope(bool isOn, char const* category, char const* name) noexcept : mIsOn(isOn) {
         if (!isOn) return;
         mCategory = category;
@@ -90,7 +92,6 @@ private:
         if (mIsOn && mCount < Trace::kMaxArguments) mArguments[mCount++] = argument;
     }
 
-    // Only mIsOn is written while the trace is off.
     bool const mIsOn;
     char const* mCategory;
     char const* mName;

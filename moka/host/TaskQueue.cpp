@@ -137,8 +137,8 @@ void TaskQueue::RunTasks(ITask* first) {
             RunGuarded("mok_log", "TaskQueue: a task", [&task] { task->run(); });
         }
         if (trace) trace->End();
-        // Whoever waited may stop the trace, which is to have the task.
-        if (trace && done + 1 >= mDone.target) trace->AddPending();
+        // Whoever waited may stop the trace, which is to have the tasks.
+        if (trace && (!first || done + 1 >= mDone.target)) trace->AddPending();
         MarkDone(++done);
     }
 }

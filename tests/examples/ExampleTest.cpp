@@ -30,8 +30,7 @@ std::string theProgram;
 // The example, with its messages in a file. Killed at the end of the scope.
 class Program {
 public:
-    Program() : mMessages(theProgram + ".log") {
-        mProcess = fork();
+    Program() : mMessages(theProgram + ".log"), mProcess(fork()) {
         if (mProcess == 0) Become();
     }
     ~Program() {
@@ -71,7 +70,7 @@ private:
     }
 
     std::string const mMessages;
-    pid_t mProcess = 0;
+    pid_t mProcess; // 0 once it has ended
     int mStatus = -1;
 };
 

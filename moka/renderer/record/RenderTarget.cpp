@@ -58,8 +58,8 @@ void RenderTarget::ReadPixels(int x, int y, int width, int height, PixelDestinat
     if (block.IsEmpty()) return;
     block.skippedRows += destination.skipRows;
     block.skippedPixels += destination.skipPixels;
-    mRecorder->Flush();
     TraceScope const trace("renderer", "ReadPixels", "bytes", block.GetBytes());
+    mRecorder->Flush();
     mRecorder->GetDevice().ReadPixels(mRef, block, destination.pixels, rowLength);
     mRecorder->counters.bytesReadBack += block.GetBytes();
 }

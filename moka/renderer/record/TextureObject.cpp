@@ -112,8 +112,8 @@ void TextureObject::Upload(Rect const& rect, void const* pixels, int stride) {
     PixelBlock const block = PixelBlock::Clip(rect.left, rect.top, std::int64_t{rect.right} - rect.left,
                                               std::int64_t{rect.bottom} - rect.top, GetWidth(), GetHeight());
     if (block.IsEmpty()) return;
-    recorder.FlushIfUsed(mStorage->GetName());
     TraceScope const trace("renderer", "Upload", "bytes", block.GetBytes());
+    recorder.FlushIfUsed(mStorage->GetName());
     recorder.GetDevice().Upload(mStorage->GetName(), block, pixels, stride > 0 ? stride : tight);
     recorder.counters.bytesUploaded += block.GetBytes();
 }
