@@ -15,7 +15,10 @@ using namespace Moka;
 
 class PageWidget final : public QOpenGLWidget {
 public:
-    ~PageWidget() override { Detach(); }
+    ~PageWidget() override {
+        if (context()) context()->disconnect(this); // it goes after this part of the widget
+        Detach();
+    }
 
 protected:
     void initializeGL() override {
