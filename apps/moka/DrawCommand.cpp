@@ -9,6 +9,7 @@
 #include "apps/moka/StandardStreams.h"
 #include "apps/moka/Text.h"
 #include "apps/moka/Watch.h"
+#include "moka/base/Trace.h"
 #include "scenes/SceneError.h"
 #include "scenes/SceneFile.h"
 
@@ -36,6 +37,7 @@ struct DrawOptions {
     std::string input;
     std::string output;
     std::string format; // of standard output
+    std::string trace;  // empty for none
     bool watch = false;
     bool verbose = false;
 };
@@ -48,8 +50,28 @@ Scenes::Scene Load(std::string const& path) {
     }
 }
 
+// A trace of one drawing. What goes wrong with it is told when the picture is there, which it spoils not.
+class DrawTrace {
+public:
+    explicit DrawTrace(std::string const& path) {
+        if (!path.empty()) Trace::Start(path, &mError);
+    }
+    ~DrawTrace() { Trace::Stop(nullptr); }
+    DrawTrace(DrawTrace const&) = delete;
+    DrawTrace& operator=(DrawTrace const&) = delete;
+
+    void Finish() {
+        Trace::Stop(mError.empty() ? &mError : nullptr);
+        if (!mError.empty()) throw Failure(MakePrintable(mError));
+    }
+
+private:
+    std::string mError;
+};
+
 // Draws once, on a render thread of its own.
 void Draw(DrawOptions const& options, Interruption& interruption) {
+    DrawTrace trace(options.trace);
     OutputFile output(options.output, options.format.empty() ? "png" : options.format);
     Scenes::Picture picture;
     {
@@ -63,10 +85,12 @@ void Draw(DrawOptions const& options, Interruption& interruption) {
         SavePicture(picture, output, interruption);
     }
     output.Send();
-    if (output.IsStream()) return;
-    std::printf("%s -> %s (%dx%d)\n", MakePrintable(options.input).c_str(),
-                MakePrintable(options.output).c_str(), picture.width, picture.height);
-    std::fflush(stdout); // whoever watches sees it at once
+    if (!output.IsStream()) {
+        std::printf("%s -> %s (%dx%d)\n", MakePrintable(options.input).c_str(),
+                    MakePrintable(options.output).c_str(), picture.width, picture.height);
+        std::fflush(stdout); // whoever watches sees it at once
+    }
+    trace.Finish();
 }
 
 // Until it is interrupted. A mistake is told, and the last picture stays.
@@ -85,6 +109,10 @@ void RunDraw(DrawOptions const& options) {
     if (!options.format.empty() && !IsStandardStream(options.output))
         throw Failure(ExitStatus::Usage, "--to is for standard output (-o -); " + options.output +
                                              " says its format by its extension");
+    if (!options.trace.empty() && options.trace == options.output)
+        throw Failure(ExitStatus::Usage, "the trace and the picture cannot both be " + options.output);
+    if (IsStandardStream(options.trace))
+        throw Failure(ExitStatus::Usage, "--trace needs the name of a file; - is none");
     bool const isStream = IsStandardStream(options.input) || IsStandardStream(options.output);
     if (options.watch && isStream)
         throw Failure(ExitStatus::Usage, "--watch needs the names of two files; - is none");
@@ -117,6 +145,13 @@ void AddDrawCommand(CLI::App& app) {
         ->check(CLI::Validator(CheckFormat, ""));
     command->add_flag("-w,--watch", options->watch,
                       "Draw again whenever the scene's file changes, until interrupted");
+    command
+        ->add_option(
+            "--trace", options->trace,
+            "Write what each thread did, and when, for Perfetto or Chrome's about:tracing; replaced if it "
+            "exists")
+        ->type_name("FILE")
+        ->check(CLI::Validator(CheckPath, ""));
     command->add_flag("-v,--verbose", options->verbose,
                       "Tell on stderr what happens, with the library's log");
     command->callback([options] { RunDraw(*options); });

@@ -7,13 +7,31 @@
 #include <EGL/eglext.h>
 
 #include <algorithm>
+#include <utility>
 
 namespace Moka::detail {
 
 std::unique_ptr<EglContext> EglContext::Open(EglRequest const& request, std::string* error) {
+    if (request.window != 0) return OpenInWindow(request, error);
+    return OpenOneOf(ListEglPlatforms(), request, error);
+}
+
+std::unique_ptr<EglContext> EglContext::OpenInWindow(EglRequest const& request, std::string* error) {
+    std::string missing;
+    auto watch = XWindowWatch::Open(request.windowDisplay, request.window, &missing);
+    if (!missing.empty()) {
+        error->swap(missing);
+        return nullptr;
+    }
+    void* const connection = watch ? watch->GetConnection() : nullptr;
+    auto context = OpenOneOf(ListWindowPlatforms(connection, request.windowDisplay), request, error);
+    if (context) context->mWatch = std::move(watch);
+    return context;
+}
+
+std::unique_ptr<EglContext> EglContext::OpenOneOf(std::vector<EglPlatform> const& platforms,
+                                                  EglRequest const& request, std::string* error) {
     std::string tried;
-    std::vector<EglPlatform> const platforms =
-        request.window != 0 ? std::vector{GetWindowPlatform(request.windowDisplay)} : ListEglPlatforms();
     for (EglPlatform const& platform : platforms) {
         std::unique_ptr<EglContext> context(new EglContext(platform));
         if (context->Build(request)) return context;
@@ -64,7 +82,8 @@ bool EglContext::BuildOffscreen(EglRequest const& request) {
 bool EglContext::BuildInWindow(EglRequest const& request) {
     if (!ChooseConfig(EGL_WINDOW_BIT) || !CreateWindowSurface(request.window)) return false;
     mPath += ", window";
-    return CreateContext(request.debug) && MakeCurrent();
+    if (!CreateContext(request.debug) || !MakeCurrent()) return false;
+    return eglSwapInterval(mDisplay, request.swapInterval) || Fail("eglSwapInterval");
 }
 
 bool EglContext::MakeCurrent() {
@@ -72,9 +91,12 @@ bool EglContext::MakeCurrent() {
 }
 
 bool EglContext::SwapBuffers() {
-    if (eglSwapBuffers(mDisplay, mSurface)) return true;
-    __android_log_print(ANDROID_LOG_ERROR, "mok_log", "the window cannot be shown: %s",
-                        DescribeEglFailure("eglSwapBuffers").c_str());
+    bool const isGone = mWatch && mWatch->IsGone();
+    if (!isGone && eglSwapBuffers(mDisplay, mSurface)) return true;
+    std::string const reason =
+        isGone ? "it was destroyed, or its X server has ended" : DescribeEglFailure("eglSwapBuffers");
+    __android_log_print(ANDROID_LOG_ERROR, "mok_log", "the window cannot be shown any more: %s",
+                        reason.c_str());
     return false;
 }
 

@@ -4,6 +4,7 @@
 #pragma once
 
 #include "moka/host/EglPlatform.h"
+#include "moka/host/XWindowWatch.h"
 
 #include <EGL/egl.h>
 
@@ -21,6 +22,7 @@ struct EglRequest {
     // A window of the window system's, which is the default frame buffer then; 0 for none.
     std::uintptr_t window = 0;
     void* windowDisplay = nullptr;
+    int swapInterval = 1; // of the window
 };
 
 class EglContext {
@@ -34,11 +36,16 @@ public:
     std::string const& GetPath() const { return mPath; }
     std::string const& GetVersion() const { return mVersion; }
 
-    // Shows what was drawn into the window's frame buffer. False, with one error line, when EGL refuses.
+    // Shows what was drawn into the window's frame buffer. False, with one error line, when the window is gone or
+    // EGL refuses.
     bool SwapBuffers();
 
 private:
     explicit EglContext(EglPlatform const& platform);
+    // Null, with the reason, when there is no such window.
+    static std::unique_ptr<EglContext> OpenInWindow(EglRequest const& request, std::string* error);
+    static std::unique_ptr<EglContext> OpenOneOf(std::vector<EglPlatform> const& platforms,
+                                                 EglRequest const& request, std::string* error);
 
     // Each false with mFailure set.
     bool Build(EglRequest const& request);
@@ -56,6 +63,7 @@ private:
     EGLint GetBits(EGLConfig config, EGLint channel) const;
     bool IsAtLeast15() const { return mMajor > 1 || (mMajor == 1 && mMinor >= 5); }
 
+    std::unique_ptr<XWindowWatch> mWatch; // null where nothing can be known of the window
     EGLDisplay mDisplay;
     bool mInitialized = false; // by us, so terminated by us
     EGLint mMajor = 0;

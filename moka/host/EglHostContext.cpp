@@ -26,7 +26,7 @@ private:
 std::unique_ptr<HostContext> HostContext::Open(RenderThreadOptions const& options, std::string* error) {
     std::unique_ptr<EglContext> egl =
         EglContext::Open({options.debugContext, options.surfaceWidth, options.surfaceHeight,
-                          options.nativeWindow, options.nativeDisplay},
+                          options.nativeWindow, options.nativeDisplay, options.swapInterval},
                          error);
     return egl ? std::make_unique<EglHostContext>(std::move(egl)) : nullptr;
 }

@@ -15,6 +15,8 @@ constexpr EGLint kPlatformAngleType = 0x3203;
 constexpr EGLint kPlatformAngleDeviceType = 0x3209;
 constexpr EGLint kPlatformAngleDeviceSwiftShader = 0x3487;
 constexpr EGLint kPlatformAngleVulkan = 0x3450;
+// From EGL_EXT_platform_xcb, newer than some headers.
+constexpr EGLenum kPlatformXcb = 0x31DC;
 
 template <class Function>
 Function Load(char const* name) {
@@ -78,9 +80,18 @@ private:
 
 std::vector<EglPlatform> ListEglPlatforms() { return Finder().List(); }
 
-// EGL's native types are a pointer or a number, as the window system has it: only this cast suits both.
-EglPlatform GetWindowPlatform(void* nativeDisplay) {
-    return Finish("window system", eglGetDisplay((EGLNativeDisplayType)nativeDisplay), "eglGetDisplay");
+std::vector<EglPlatform> ListWindowPlatforms(void* xcbConnection, void* nativeDisplay) {
+    std::vector<EglPlatform> platforms;
+    char const* const extensions = eglQueryString(EGL_NO_DISPLAY, EGL_EXTENSIONS);
+    if (xcbConnection && HasEglExtension(extensions, "EGL_EXT_platform_xcb")) {
+        auto const getDisplay = Load<PFNEGLGETPLATFORMDISPLAYEXTPROC>("eglGetPlatformDisplayEXT");
+        platforms.push_back(Finish("XCB platform", getDisplay(kPlatformXcb, xcbConnection, nullptr),
+                                   "eglGetPlatformDisplayEXT"));
+    }
+    // EGL's native types are a pointer or a number, as the window system has it: only this cast suits both.
+    platforms.push_back(
+        Finish("window system", eglGetDisplay((EGLNativeDisplayType)nativeDisplay), "eglGetDisplay"));
+    return platforms;
 }
 
 bool HasEglExtension(char const* extensions, char const* name) {

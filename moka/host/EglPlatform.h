@@ -18,8 +18,9 @@ struct EglPlatform {
 // Only what the EGL at hand offers. Never empty: the default display stands last.
 std::vector<EglPlatform> ListEglPlatforms();
 
-// The display of a window system's connection; null is the default one.
-EglPlatform GetWindowPlatform(void* nativeDisplay);
+// The displays on which a window may be: the one of an xcb_connection_t, where EGL takes it and it is not null,
+// and the one of a window system's connection, for which null is the default one.
+std::vector<EglPlatform> ListWindowPlatforms(void* xcbConnection, void* nativeDisplay);
 
 // Whether a list as eglQueryString gives it, which may be null, has a name.
 bool HasEglExtension(char const* extensions, char const* name);

@@ -25,7 +25,7 @@ public:
     virtual std::string const& GetVersion() const = 0;
     // For RendererFactory::AttachContext; may be null.
     virtual RendererProcLoader GetLoader() const = 0;
-    // False, with one error line, when there is nothing to show it in.
+    // False, with one error line, when there is nothing to show it in, now and from now on.
     virtual bool SwapBuffers() = 0;
 };
 

@@ -3,11 +3,15 @@
 #include "moka/base/Check.h"
 #include "moka/base/RunGuarded.h"
 #include "moka/base/Thread.h"
-#include "moka/graphics/task/WorkerTask.h"
+#include "moka/base/Trace.h"
+#include "moka/base/log/AndroidLog.h"
+#include "moka/graphics/task/ITask.h"
+#include "moka/host/FramePacer.h"
 #include "moka/host/HostContext.h"
 #include "moka/renderer/IRendererDeviceCaps.h"
 
 #include <atomic>
+#include <cstdlib>
 #include <future>
 #include <new>
 #include <utility>
@@ -50,11 +54,51 @@ private:
     std::promise<bool> mResult; // here, so that the caller that it wakes cannot destroy it at work
 };
 
+// A trace for as long as a render thread runs, or, when the environment asks for it, from now on.
+class ThreadTrace {
+public:
+    explicit ThreadTrace(std::string const& path) : mIsOwn(!path.empty()) {
+        char const* const wanted = mIsOwn ? path.c_str() : std::getenv("MOKA_TRACE");
+        if (!wanted || !*wanted || (!mIsOwn && Trace::IsOn())) return;
+        std::string error;
+        mIsOn = Trace::Start(wanted, &error);
+        if (!mIsOn) __android_log_print(ANDROID_LOG_WARN, "mok_log", "RenderThread: %s", error.c_str());
+    }
+    ~ThreadTrace() { Stop(); }
+    ThreadTrace(ThreadTrace const&) = delete;
+    ThreadTrace& operator=(ThreadTrace const&) = delete;
+
+    // A failure to write has its line already.
+    void Stop() {
+        if (mIsOwn && std::exchange(mIsOn, false)) Trace::Stop(nullptr);
+    }
+
+private:
+    bool const mIsOwn;
+    bool mIsOn = false;
+};
+
+std::string FindMistake(RenderThreadOptions const& options) {
+    if (options.surfaceWidth < 1 || options.surfaceHeight < 1) {
+        return "a surface of " + std::to_string(options.surfaceWidth) + " x " +
+               std::to_string(options.surfaceHeight) + " pixels; both sides must be at least 1";
+    }
+    if (options.framesInFlight < 1)
+        return "framesInFlight is " + std::to_string(options.framesInFlight) + "; it must be at least 1";
+    if (options.swapInterval < 0)
+        return "swapInterval is " + std::to_string(options.swapInterval) + "; it must be at least 0";
+    return {};
+}
+
 } // namespace
 
 struct RenderThread::Impl {
     Impl(RenderThread& queue, RenderThreadOptions const& settings)
-        : owner(queue), options(settings), thread(&Impl::Main, this, "moka-render") {}
+        : owner(queue),
+          options(settings),
+          trace(options.tracePath),
+          pacer(options.framesInFlight),
+          thread(&Impl::Main, this, "moka-render") {}
 
     static void Main(void* self) { static_cast<Impl*>(self)->Live(); }
 
@@ -64,7 +108,10 @@ struct RenderThread::Impl {
             return started.set_value("another RenderThread is running in this process; stop it first");
         }
         std::string error;
-        context = detail::HostContext::Open(options, &error);
+        {
+            TraceScope const opening("host", "open the context");
+            context = detail::HostContext::Open(options, &error);
+        }
         if (!context) return started.set_value(std::move(error));
         if (!RendererFactory::AttachContext(options.limits, context->GetLoader())) {
             error = "the renderer refused the context reached through " + context->GetPath() +
@@ -81,10 +128,26 @@ struct RenderThread::Impl {
         context.reset();
     }
 
-    void Present() {
+    // On the render thread. What waits when the window goes is dropped.
+    void Show() {
+        Trace::NameTask("Present");
+        if (isWindowGone) return;
+        TraceScope const frame("frame", "Present", "number", ++shown);
         RendererFactory::Flush();
-        context->SwapBuffers();
+        TraceScope const swap("frame", "SwapBuffers");
+        if (context->SwapBuffers()) return;
+        isWindowGone = true;
+        isRefusalTold = true;
     }
+
+    // One line, however often it is tried and for whatever reason.
+    bool Refuse(char const* reason) {
+        if (isRefusalTold.exchange(true)) return false;
+        __android_log_print(ANDROID_LOG_ERROR, "mok_log", "RenderThread::Present: %s", reason);
+        return false;
+    }
+
+    bool Present();
 
     void DescribeContext() {
         IRendererDeviceCaps const* const caps = RendererFactory::GetRendererDeviceCaps();
@@ -98,20 +161,53 @@ struct RenderThread::Impl {
 
     RenderThread& owner;
     RenderThreadOptions const options;
+    ThreadTrace trace;
+    detail::FramePacer pacer;
+    std::atomic<bool> isWindowGone{false};
+    std::atomic<bool> isRefusalTold{false};
+    std::uint64_t shown = 0; // frames
     RenderContextInfo info;
     std::unique_ptr<detail::HostContext> context; // made and destroyed on the thread
     std::promise<std::string> started;            // an error, or empty
     Thread thread;
 };
 
+namespace {
+
+// Shows a frame, and lets the next one come when it is freed, whether it ran or not.
+template <class Impl>
+class PresentTask final : public ITask {
+public:
+    explicit PresentTask(Impl& impl) : mImpl(impl) {}
+    ~PresentTask() override { mImpl.pacer.Leave(); }
+    void run() override { mImpl.Show(); }
+
+private:
+    Impl& mImpl;
+};
+
+} // namespace
+
+bool RenderThread::Impl::Present() {
+    if (options.nativeWindow == 0) return Refuse("there is no window; give Start a nativeWindow");
+    if (isWindowGone) return false; // told when it went
+    pacer.Enter(!owner.IsConsumerThread());
+    std::unique_ptr<ITask> task(new (std::nothrow) PresentTask<Impl>(*this));
+    if (!task) {
+        pacer.Leave();
+        return Refuse("not enough memory");
+    }
+    if (isWindowGone) return false;
+    if (!owner.Post(task.get())) return Refuse("the render thread has been stopped");
+    static_cast<void>(task.release());
+    return true;
+}
+
 RenderThread::RenderThread() = default;
 
 std::unique_ptr<RenderThread> RenderThread::Start(RenderThreadOptions const& options, std::string* error) {
-    std::string failure;
-    if (options.surfaceWidth < 1 || options.surfaceHeight < 1) {
-        failure = "a surface of " + std::to_string(options.surfaceWidth) + " x " +
-                  std::to_string(options.surfaceHeight) + " pixels; both sides must be at least 1";
-    } else {
+    std::string failure = FindMistake(options);
+    if (failure.empty()) {
         std::unique_ptr<RenderThread> self(new RenderThread);
         self->mImpl = std::make_unique<Impl>(*self, options);
         failure = self->mImpl->thread.Start() ? self->mImpl->started.get_future().get()
@@ -128,13 +224,12 @@ void RenderThread::Stop() {
     MOKA_CHECK(!IsConsumerThread(), "RenderThread::Stop waits for the render thread, so not from there");
     RequestStop();
     mImpl->thread.Join();
+    mImpl->trace.Stop();
 }
 
 RenderContextInfo const& RenderThread::GetContextInfo() const { return mImpl->info; }
 
-bool RenderThread::Present() {
-    return mImpl->options.nativeWindow != 0 && WorkerTask::PostMember(this, mImpl.get(), &Impl::Present);
-}
+bool RenderThread::Present() { return mImpl->Present(); }
 
 bool RenderThread::Call(std::function<void()> const& function) {
     if (IsConsumerThread()) return RunCall(function);

@@ -29,9 +29,19 @@ struct RenderThreadOptions {
     int surfaceHeight = 1;
     // A window whose frame buffer is the default one, in the place of the surface: what the platform's EGL
     // takes, an X11 Window, a wl_egl_window* or an ANativeWindow*, and the connection it belongs to (null for
-    // the default one). Both outlive the thread. An X11 connection is then used by two threads: XInitThreads.
+    // the default one). Both outlive the thread. Of an X11 connection only the server's name is used, where EGL
+    // takes a connection of ours; elsewhere two threads use it: XInitThreads. docs/windows.md tells more.
     std::uintptr_t nativeWindow = 0;
     void* nativeDisplay = nullptr;
+    // Presents that may wait to be shown, at least 1; the next one waits for the oldest. 1 is for ink: less waits
+    // between the pen and the screen, and drawing and showing take turns.
+    int framesInFlight = 2;
+    // Refreshes of the screen for each present, at least 0: 0 shows at once. The driver may clamp it.
+    int swapInterval = 1;
+    // A trace (moka/base/Trace.h) of the process, from the start of the thread until it has stopped. A file that
+    // cannot be written is one warning. Empty: what the environment variable MOKA_TRACE names, if it is set, from
+    // the first start in the process until the process ends.
+    std::string tracePath{};
 };
 
 // What was reached, and how.
@@ -59,8 +69,9 @@ public:
     // queue refused it or it threw (one error line). On the render thread itself it runs at once.
     bool Call(std::function<void()> const& function);
 
-    // Any thread: shows in the window what was posted before; posted itself, so it returns at once. False
-    // when the queue refused it, or when there is no window.
+    // Any thread: shows in the window what was posted before. Posted itself; it waits while framesInFlight
+    // presents are on their way, but never on the render thread. False when there
+    // is no window, when it is gone, and after Stop(); the first time with one error line.
     bool Present();
 
 private:

@@ -4,9 +4,11 @@
 #include "moka/base/log/AndroidLog.h"
 #include "moka/graphics/task/ITask.h"
 #include "moka/host/ShortLock.h"
+#include "moka/host/TaskTrace.h"
 
 #include <algorithm>
 #include <memory>
+#include <optional>
 #include <utility>
 
 namespace Moka {
@@ -61,6 +63,7 @@ void TaskQueue::WaitForTasks() {
     }
     if (mDone.count >= target) return;
 
+    TraceScope const trace("wait", "WaitForTasks");
     std::unique_lock<std::mutex> lock(mWaiters.mutex);
     ++mWaiters.count;
     for (;;) {
@@ -110,8 +113,10 @@ ITask* TaskQueue::TakeSoon() {
 
 // Null: stopped, drained, and refusing from now on.
 ITask* TaskQueue::AwaitTasks() {
+    std::optional<TraceScope> trace; // ends without the lock
     std::unique_lock<std::mutex> lock(mIn.mutex);
     while (!mIn.first && !mIn.stopping) {
+        if (!trace) trace.emplace("wait", "no tasks");
         mIn.sleeping = true;
         mIn.work.wait(lock);
     }
@@ -123,11 +128,17 @@ ITask* TaskQueue::AwaitTasks() {
 
 void TaskQueue::RunTasks(ITask* first) {
     std::uint64_t done = mDone.count.load(std::memory_order_relaxed);
+    std::optional<detail::TaskTrace> trace;
+    if (Trace::IsOn()) trace.emplace();
     while (first) {
+        if (trace) trace->Begin(*first);
         {
             std::unique_ptr<ITask> const task(std::exchange(first, first->next));
             RunGuarded("mok_log", "TaskQueue: a task", [&task] { task->run(); });
         }
+        if (trace) trace->End();
+        // Whoever waited may stop the trace, which is to have the tasks.
+        if (trace && (!first || done + 1 >= mDone.target)) trace->AddPending();
         MarkDone(++done);
     }
 }

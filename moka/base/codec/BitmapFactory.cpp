@@ -3,6 +3,7 @@
 #include "moka/base/Bitmap.h"
 #include "moka/base/Log.h"
 #include "moka/base/String.h"
+#include "moka/base/Trace.h"
 #include "moka/base/codec/ImageCodec.h"
 #include "moka/base/log/AndroidLog.h"
 
@@ -105,10 +106,25 @@ Bitmap* Wrap(unsigned char* buffer, PixelSize size, int stride, int format, bool
     return bitmap.release();
 }
 
+char const* NameOf(ImageFormat format) {
+    for (Extension const& known : kExtensions) {
+        if (known.format == format) return known.text;
+    }
+    return "unknown";
+}
+
+void Describe(TraceScope& trace, ImageFormat format, PixelSize size) {
+    trace.Set("format", NameOf(format));
+    trace.Set("width", static_cast<std::uint64_t>(size.width));
+    trace.Set("height", static_cast<std::uint64_t>(size.height));
+}
+
 Bitmap* Decode(ImageSource& source, PixelSize target, std::string& reason) {
+    TraceScope trace("image", "load");
     detail::PixelBuffer image;
     ImageCodec const* const codec = FindCodec(source, reason);
     if (!codec || !codec->decode(source, target, image, reason)) return nullptr;
+    Describe(trace, codec->format, image.size);
     Bitmap* const bitmap = Wrap(image.pixels.get(), image.size, static_cast<int>(image.GetStride()),
                                 Bitmap::kFormatRgba8888, true);
     if (bitmap) {
@@ -173,7 +189,9 @@ bool ToView(Bitmap const* bitmap, detail::PixelView& view, std::string& reason) 
 bool Save(Bitmap const* bitmap, std::string const& path, int quality, std::string& reason) {
     detail::PixelView view{};
     ImageCodec const* codec = nullptr;
+    TraceScope trace("image", "save");
     if (!FindEncoder(path, codec, reason) || !ToView(bitmap, view, reason)) return false;
+    Describe(trace, codec->format, view.size);
     detail::AtomicFile file;
     bool const isSaved = file.Open(path) && codec->encode(view, quality, file, reason) && file.Commit();
     // When the file failed, what the codec has to say about it is only a consequence.

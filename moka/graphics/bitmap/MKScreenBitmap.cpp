@@ -1,5 +1,6 @@
 #include "moka/graphics/bitmap/MKScreenBitmap.h"
 
+#include "moka/base/Trace.h"
 #include "moka/graphics/bitmap/BlockingRead.h"
 #include "moka/graphics/task/WorkerTask.h"
 #include "moka/renderer/IRenderTarget.h"
@@ -23,6 +24,7 @@ MKScreenBitmap::~MKScreenBitmap() {
 }
 
 void MKScreenBitmap::createRenderTargetRT(int width, int height, FramebufferType type, bool release) {
+    Trace::NameTask("createRenderTargetRT");
     CreateRenderTarget(width, height, type, "createRenderTargetRT");
     if (release) Unref();
 }
@@ -37,6 +39,7 @@ unsigned int MKScreenBitmap::GetPixel(Point const& p) {
 }
 
 void MKScreenBitmap::getPixelRT(unsigned int& result, Point const& p) {
+    Trace::NameTask("getPixelRT");
     result = ReadPixel(p);
     Unref();
 }
@@ -46,6 +49,7 @@ void MKScreenBitmap::GetPixelAsync(Point const& p, void* userData, PixelCallback
 }
 
 void MKScreenBitmap::getPixelAsyncRT(Point const& p, void* userData, PixelCallback callback) {
+    Trace::NameTask("getPixelAsyncRT");
     auto const self = RefPtr<MKScreenBitmap>::Adopt(this);
     unsigned int const pixel = ReadPixel(p);
     if (callback) callback(pixel, userData);
@@ -60,6 +64,7 @@ void MKScreenBitmap::GetBitmapData(Rect const& r, void* destination) {
 
 void MKScreenBitmap::getBitmapDataRT(Rect const& r, void* destination,
                                      detail::BlockingRead::Ptr const& read) {
+    Trace::NameTask("getBitmapDataRT");
     ReadBlock(r, destination);
     if (read) read->Finish(0);
     Unref();
@@ -72,6 +77,7 @@ void MKScreenBitmap::GetBitmapDataAsync(Rect const& r, void* destination, void* 
 
 void MKScreenBitmap::getBitmapDataAsyncRT(Rect const& r, void* destination, void* userData,
                                           DataCallback callback) {
+    Trace::NameTask("getBitmapDataAsyncRT");
     auto const self = RefPtr<MKScreenBitmap>::Adopt(this);
     ReadBlock(r, destination);
     if (callback) callback(r, destination, userData);

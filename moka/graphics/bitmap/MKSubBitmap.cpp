@@ -1,5 +1,6 @@
 #include "moka/graphics/bitmap/MKSubBitmap.h"
 
+#include "moka/base/Trace.h"
 #include "moka/graphics/bitmap/BlockingRead.h"
 #include "moka/graphics/bitmap/MKDepthStencilBuffer.h"
 #include "moka/graphics/bitmap/MKFrameBuffer.h"
@@ -39,11 +40,13 @@ MKSubBitmap::~MKSubBitmap() {
 }
 
 void MKSubBitmap::createTextureRT(int x, int y, int rowLength, void const* pixels, bool textureFlag) {
+    Trace::NameTask("createTextureRT");
     CreateTexture(x, y, rowLength, pixels, textureFlag);
     Unref();
 }
 
 void MKSubBitmap::createSharedTextureRT(IMKSubBitmap* model) {
+    Trace::NameTask("createSharedTextureRT");
     if (model) {
         CreateTexture(model->GetTexture());
         model->Unref();
@@ -94,6 +97,7 @@ void MKSubBitmap::UpdateBitmap(void const* pixels, int stride) {
 }
 
 void MKSubBitmap::updateBitmapRT(void const* pixels, int stride) {
+    Trace::NameTask("updateBitmapRT");
     Upload(pixels, stride);
     Unref();
 }
@@ -103,6 +107,7 @@ void MKSubBitmap::UpdateBitmap(Rect const& r, void const* pixels, int stride) {
 }
 
 void MKSubBitmap::updateBitmapRectRT(Rect const& r, void const* pixels, int stride) {
+    Trace::NameTask("updateBitmapRectRT");
     Upload(r, pixels, stride);
     Unref();
 }
@@ -115,6 +120,7 @@ unsigned int MKSubBitmap::GetPixel(Point const& p) {
 }
 
 void MKSubBitmap::getPixelRT(Point const& p, RefPtr<detail::BlockingRead> const& read) {
+    Trace::NameTask("getPixelRT");
     unsigned int const pixel = ReadPixel(p);
     if (read) read->Finish(pixel);
     Unref();
@@ -125,6 +131,7 @@ void MKSubBitmap::GetPixelAsync(Point const& p, void* userData, PixelCallback ca
 }
 
 void MKSubBitmap::getPixelAsyncRT(Point const& p, void* userData, PixelCallback callback) {
+    Trace::NameTask("getPixelAsyncRT");
     auto const self = RefPtr<MKSubBitmap>::Adopt(this);
     unsigned int const pixel = ReadPixel(p);
     if (callback) callback(pixel, userData);
@@ -139,6 +146,7 @@ void MKSubBitmap::GetBitmapData(Rect const& r, void* destination) {
 
 void MKSubBitmap::getBitmapDataRT(Rect const& r, void* destination,
                                   RefPtr<detail::BlockingRead> const& read) {
+    Trace::NameTask("getBitmapDataRT");
     ReadBlock(r, destination);
     if (read) read->Finish(0);
     Unref();
@@ -151,6 +159,7 @@ void MKSubBitmap::GetBitmapDataAsync(Rect const& r, void* destination, void* use
 
 void MKSubBitmap::getBitmapDataAsyncRT(Rect const& r, void* destination, void* userData,
                                        DataCallback callback) {
+    Trace::NameTask("getBitmapDataAsyncRT");
     auto const self = RefPtr<MKSubBitmap>::Adopt(this);
     ReadBlock(r, destination);
     if (callback) callback(r, destination, userData);
@@ -192,6 +201,7 @@ IMKSubBitmap* MKSubBitmap::Clone() {
 }
 
 void MKSubBitmap::copyTextureRT(MKSubBitmapBase* target) {
+    Trace::NameTask("copyTextureRT");
     CopyTextureTo(target);
     Unref();
 }

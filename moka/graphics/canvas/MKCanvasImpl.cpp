@@ -1,6 +1,7 @@
 #include "moka/graphics/canvas/MKCanvasImpl.h"
 
 #include "moka/base/RefPtr.h"
+#include "moka/base/Trace.h"
 #include "moka/base/log/AndroidLog.h"
 #include "moka/graphics/bitmap/IMKSubBitmap.h"
 #include "moka/graphics/bitmap/IMKTextureBitmap.h"
@@ -103,6 +104,7 @@ private:
 };
 
 void MKCanvasImpl::DrawRT(IMKCustomDrawable* drawable, Matrix3<float> const& m, MKPaint const& paint) {
+    Trace::NameTask("DrawRT");
     auto const held = RefPtr<IMKCustomDrawable>::Adopt(drawable);
     if (!held) return;
     for (FrameBuffers frame(GetBitmap()); frame.Next();) {
@@ -114,6 +116,7 @@ void MKCanvasImpl::DrawRT(IMKCustomDrawable* drawable, Matrix3<float> const& m, 
 
 void MKCanvasImpl::DrawLineRT(PointF const& a, PointF const& b, Matrix3<float> const& m,
                               MKPaint const& paint) {
+    Trace::NameTask("DrawLineRT");
     if (DrawsNoLine(a, b, paint)) return;
     MKLineDrawable* const drawable = FindOrMake(mLineDrawable);
     if (!drawable) return;
@@ -123,6 +126,7 @@ void MKCanvasImpl::DrawLineRT(PointF const& a, PointF const& b, Matrix3<float> c
 
 void MKCanvasImpl::DrawSimpleLineRT(PointF const& a, PointF const& b, Matrix3<float> const& m,
                                     MKPaint const& paint) {
+    Trace::NameTask("DrawSimpleLineRT");
     if (DrawsNoLine(a, b, paint)) return;
     MKLineDrawable* const drawable = FindOrMake(mLineDrawable);
     if (!drawable) return;
@@ -132,6 +136,7 @@ void MKCanvasImpl::DrawSimpleLineRT(PointF const& a, PointF const& b, Matrix3<fl
 
 void MKCanvasImpl::DrawSimpleLinesRT(std::vector<PointF>* points, Matrix3<float> const& m,
                                      MKPaint const& paint) {
+    Trace::NameTask("DrawSimpleLinesRT");
     std::unique_ptr<std::vector<PointF>> own(points);
     if (!own || own->empty() || paint.GetLineWidth() < 1.0f) return;
     bool const isFirst = !mLineDrawable;
@@ -148,6 +153,7 @@ void MKCanvasImpl::DrawSimpleLinesRT(std::vector<PointF>* points, Matrix3<float>
 }
 
 void MKCanvasImpl::DrawRectRT(RectF const& r, Matrix3<float> const& m, MKPaint const& paint) {
+    Trace::NameTask("DrawRectRT");
     if (HasNoExtent(r)) return;
     MKRectDrawable* const drawable = FindOrMake(mRectDrawable);
     if (!drawable) return;
@@ -156,6 +162,7 @@ void MKCanvasImpl::DrawRectRT(RectF const& r, Matrix3<float> const& m, MKPaint c
 
 void MKCanvasImpl::DrawRoundRectRT(RectF const& r, float rx, float ry, Matrix3<float> const& m,
                                    MKPaint const& paint) {
+    Trace::NameTask("DrawRoundRectRT");
     if (HasNoExtent(r)) return;
     MKRoundRectDrawable* const drawable = FindOrMake(mRoundRectDrawable);
     if (!drawable) return;
@@ -165,6 +172,7 @@ void MKCanvasImpl::DrawRoundRectRT(RectF const& r, float rx, float ry, Matrix3<f
 
 void MKCanvasImpl::DrawCircleRT(PointF const& c, float radius, Matrix3<float> const& m,
                                 MKPaint const& paint) {
+    Trace::NameTask("DrawCircleRT");
     if (!(radius > 0)) return;
     MKCircleDrawable* const drawable = FindOrMake(mCircleDrawable);
     if (!drawable) return;
@@ -176,6 +184,7 @@ void MKCanvasImpl::DrawCircleRT(PointF const& c, float radius, Matrix3<float> co
 
 void MKCanvasImpl::DrawBitmapRT(IMKBitmap* src, RectF const& srcRect, RectF const& dstRect,
                                 Matrix3<float> const& m, MKPaint const& paint) {
+    Trace::NameTask("DrawBitmapRT");
     auto const held = RefPtr<IMKBitmap>::Adopt(src);
     if (!held || HasNoExtent(dstRect)) return;
     if (!FindOrMake(mBitmapDrawable, mQueue) || !src->GetTextureBitmap()) return;
@@ -211,6 +220,7 @@ void MKCanvasImpl::DrawInPieces(IMKBitmap* src, RectF const& srcRect, RectF cons
 
 void MKCanvasImpl::DrawBitmapsRT(IMKBitmap* src, RectF const& srcRect, std::vector<RectF>* dstRects,
                                  Matrix3<float> const& m, MKPaint const& paint) {
+    Trace::NameTask("DrawBitmapsRT");
     auto const held = RefPtr<IMKBitmap>::Adopt(src);
     std::unique_ptr<std::vector<RectF>> const dsts(dstRects);
     IMKBitmapWritable* const writable = GetBitmap()->GetBitmapWritable();

@@ -1,5 +1,6 @@
 #include "moka/graphics/canvas/MKCanvasImplBase.h"
 
+#include "moka/base/Trace.h"
 #include "moka/graphics/bitmap/IMKBitmapCanvasAttachable.h"
 #include "moka/graphics/bitmap/IMKSubBitmap.h"
 #include "moka/graphics/bitmap/IMKTextureBitmap.h"
@@ -70,6 +71,7 @@ MKCanvasImplBase::MKCanvasImplBase(IGLMsgQueue* queue, IMKBitmap* bitmap, bool o
 MKCanvasImplBase::~MKCanvasImplBase() = default;
 
 void MKCanvasImplBase::createClippingRT() {
+    Trace::NameTask("createClippingRT");
     try {
         mClipping.reset(new (std::nothrow) MKCanvasClipping(GetBitmap()));
     } catch (std::bad_alloc const&) {
@@ -83,6 +85,7 @@ bool MKCanvasImplBase::HasFrameBuffer(int index) const {
 }
 
 void MKCanvasImplBase::ClearRT(Vector4<float> const& rgba) {
+    Trace::NameTask("ClearRT");
     bool const clipped = mClipping && mClipping->HasClips();
     for (FrameBuffers frame(GetBitmap()); frame.Next();) {
         if (mClipping) mClipping->EnableClipRT(frame.index);
@@ -94,6 +97,7 @@ void MKCanvasImplBase::ClearRT(Vector4<float> const& rgba) {
 }
 
 void MKCanvasImplBase::ClearAllRT(Vector4<float> const& rgba) {
+    Trace::NameTask("ClearAllRT");
     IRasterizerState* const rasterizer = RendererFactory::GetRasterizerState();
     bool const scissored = rasterizer->IsScissorEnabled();
     ScissorRect const saved = scissored ? rasterizer->GetScissorRect() : ScissorRect{};
@@ -107,10 +111,12 @@ void MKCanvasImplBase::ClearAllRT(Vector4<float> const& rgba) {
 }
 
 void MKCanvasImplBase::AddClipRectRT(ClipInfo const& info) {
+    Trace::NameTask("AddClipRectRT");
     if (mClipping) mClipping->AddClipRectRT(info);
 }
 
 void MKCanvasImplBase::RemoveClipRectRT(int count) {
+    Trace::NameTask("RemoveClipRectRT");
     if (mClipping) mClipping->RemoveClipRectRT(count);
 }
 

@@ -1,5 +1,6 @@
 #include "moka/graphics/canvas/MKPenCanvasImpl.h"
 
+#include "moka/base/Trace.h"
 #include "moka/base/log/AndroidLog.h"
 #include "moka/renderer/RendererFactory.h"
 
@@ -26,6 +27,7 @@ void MKPenCanvasImpl::SwitchColorWritesOn() {
 }
 
 void MKPenCanvasImpl::EnableClipRT(int) {
+    Trace::NameTask("EnableClipRT");
     if (!HasFrameBuffer(-1)) {
         // The clip of a stencil would be drawn into somebody else's.
         __android_log_print(ANDROID_LOG_ERROR, "mok_log",
@@ -40,6 +42,7 @@ void MKPenCanvasImpl::EnableClipRT(int) {
 }
 
 void MKPenCanvasImpl::DisableClipRT() {
+    Trace::NameTask("DisableClipRT");
     if (MKCanvasClipping* const clipping = GetClipping()) clipping->DisableClipRT();
     RendererFactory::InvalidateState();
 }

@@ -4,6 +4,7 @@
 #include "moka/base/Bitmap.h"
 #include "moka/base/BitmapFactory.h"
 #include "moka/base/RunGuarded.h"
+#include "moka/base/Trace.h"
 #include "moka/graphics/bitmap/IMKBitmap.h"
 #include "moka/graphics/factory/MKGraphicsFactory.h"
 #include "moka/graphics/loader/BitmapLoaderInterface.h"
@@ -148,6 +149,8 @@ Request BitmapLoaderImpl::AwaitRequest() {
 
 void BitmapLoaderImpl::Process(Request& request) {
     PathForLog<kMaxLoggedPathBytes> const path(request.path);
+    TraceScope const trace("loader", request.type == REQUEST_LOAD ? "load request" : "save request", "serial",
+                           static_cast<std::uint64_t>(request.serial));
     if (request.type == REQUEST_LOAD) {
         LogInfo("BitmapLoaderImpl::EventLoop process load request[%d]: %s", request.serial, path.Get());
         LoadBitmap(request);

@@ -45,6 +45,7 @@ struct Counters {
     Counter records;
     std::array<Counter, kRunEnds> runEnds;
     Counter flushes;
+    Counter flushedRequests; // of drawRequests, those before the last flush
     Counter listBytes;
 
     Counter frameBufferSwitches;

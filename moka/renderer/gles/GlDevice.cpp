@@ -1,5 +1,6 @@
 #include "moka/renderer/gles/GlDevice.h"
 
+#include "moka/base/Trace.h"
 #include "moka/base/log/AndroidLog.h"
 #include "moka/renderer/gles/GlPixels.h"
 #include "moka/renderer/gles/GlProgramBuilder.h"
@@ -108,6 +109,7 @@ void GlDevice::DeleteDepthStencil(DeviceName depthStencil) { frameBuffers.Delete
 
 DeviceName GlDevice::CreateProgram(char const* vertexSource, char const* fragmentSource, char const* label,
                                    ProgramLayout* layout) {
+    TraceScope const trace("renderer", "CreateProgram");
     GlslStages sources{vertexSource, fragmentSource};
     if (workarounds.Needs(GlWorkaround::AvoidMediump)) {
         sources = {MakeGlslHighp(vertexSource), MakeGlslHighp(fragmentSource)};

@@ -1,6 +1,7 @@
 #include "moka/renderer/record/Recorder.h"
 
 #include "moka/renderer/record/Caps.h"
+#include "moka/renderer/record/FlushTrace.h"
 #include "moka/renderer/record/GraphicsObject.h"
 #include "moka/renderer/record/ProgramState.h"
 #include "moka/renderer/record/RenderTarget.h"
@@ -135,6 +136,7 @@ void Recorder::AddStencilClear(DepthStencilClear const& clear) {
 
 void Recorder::Flush() {
     if (list.IsEmpty()) return;
+    FlushTrace const trace(counters);
     bool const isFull = list.IsFull();
     mDevice->Submit(list.Finish());
     ++counters.flushes;

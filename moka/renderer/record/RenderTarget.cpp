@@ -1,5 +1,6 @@
 #include "moka/renderer/record/RenderTarget.h"
 
+#include "moka/base/Trace.h"
 #include "moka/base/log/AndroidLog.h"
 #include "moka/renderer/record/DepthStencilBuffer.h"
 #include "moka/renderer/record/FrameBuffer.h"
@@ -58,6 +59,7 @@ void RenderTarget::ReadPixels(int x, int y, int width, int height, PixelDestinat
     if (block.IsEmpty()) return;
     block.skippedRows += destination.skipRows;
     block.skippedPixels += destination.skipPixels;
+    TraceScope const trace("renderer", "ReadPixels", "bytes", block.GetBytes());
     mRecorder->Flush();
     mRecorder->GetDevice().ReadPixels(mRef, block, destination.pixels, rowLength);
     mRecorder->counters.bytesReadBack += block.GetBytes();

@@ -1,5 +1,6 @@
 #include "moka/renderer/record/TextureObject.h"
 
+#include "moka/base/Trace.h"
 #include "moka/base/log/AndroidLog.h"
 #include "moka/renderer/record/Observer.h"
 #include "moka/renderer/record/Recorder.h"
@@ -111,6 +112,7 @@ void TextureObject::Upload(Rect const& rect, void const* pixels, int stride) {
     PixelBlock const block = PixelBlock::Clip(rect.left, rect.top, std::int64_t{rect.right} - rect.left,
                                               std::int64_t{rect.bottom} - rect.top, GetWidth(), GetHeight());
     if (block.IsEmpty()) return;
+    TraceScope const trace("renderer", "Upload", "bytes", block.GetBytes());
     recorder.FlushIfUsed(mStorage->GetName());
     recorder.GetDevice().Upload(mStorage->GetName(), block, pixels, stride > 0 ? stride : tight);
     recorder.counters.bytesUploaded += block.GetBytes();

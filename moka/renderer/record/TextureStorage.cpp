@@ -1,5 +1,6 @@
 #include "moka/renderer/record/TextureStorage.h"
 
+#include "moka/base/Trace.h"
 #include "moka/renderer/record/Recorder.h"
 
 #include <utility>
@@ -19,6 +20,7 @@ std::shared_ptr<TextureStorage> TextureStorage::Create(std::shared_ptr<Recorder>
     auto const* const first = static_cast<unsigned char const*>(source.pixels) + source.y * stride +
                               std::ptrdiff_t{source.x} * kBytesPerPixel;
     PixelBlock const all = PixelBlock::Clip(0, 0, width, height, width, height);
+    TraceScope const trace("renderer", "Upload", "bytes", all.GetBytes());
     device.Upload(name, all, first, stride);
     recorder->counters.bytesUploaded += all.GetBytes();
     return storage;

@@ -30,8 +30,18 @@ std::unique_ptr<XWindow> XWindow::Open(int width, int height) {
 XWindow::XWindow(std::unique_ptr<Impl> impl) : mImpl(std::move(impl)) {}
 
 XWindow::~XWindow() {
-    XDestroyWindow(mImpl->display, mImpl->window);
+    if (mImpl->window != 0) XDestroyWindow(mImpl->display, mImpl->window);
     XCloseDisplay(mImpl->display);
+}
+
+void XWindow::Resize(int width, int height) {
+    XResizeWindow(mImpl->display, mImpl->window, static_cast<unsigned>(width), static_cast<unsigned>(height));
+    XSync(mImpl->display, False);
+}
+
+void XWindow::Destroy() {
+    XDestroyWindow(mImpl->display, std::exchange(mImpl->window, 0));
+    XSync(mImpl->display, False);
 }
 
 void* XWindow::GetDisplay() const { return mImpl->display; }

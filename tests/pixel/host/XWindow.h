@@ -18,6 +18,10 @@ public:
     void* GetDisplay() const;
     std::uintptr_t GetWindow() const;
 
+    // Each returns when the server has done it.
+    void Resize(int width, int height);
+    void Destroy();
+
     // What the server shows: 0xRRGGBB.
     unsigned long GetPixel(int x, int y) const;
 
