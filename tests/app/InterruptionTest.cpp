@@ -18,8 +18,8 @@ using ::testing::EndsWith;
 using ::testing::MatchesRegex;
 
 // Random colours, which give an encoder work.
-TestImage MakeNoise(int side) {
-    TestImage image(side, side);
+Picture MakeNoise(int side) {
+    Picture image(side, side);
     unsigned state = 1;
     for (std::size_t i = 0; i < image.pixels.size(); ++i) {
         state = state * 1664525 + 1013904223;

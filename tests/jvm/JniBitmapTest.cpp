@@ -2,7 +2,7 @@
 #include "moka/base/Bitmap.h"
 #include "moka/base/log/AndroidLog.h"
 #include "tests/jvm/JavaFixture.h"
-#include "tests/support/ArrayMemory.h"
+#include "tests/support/Allocation.h"
 #include "tests/support/LogCapture.h"
 
 #include <gmock/gmock.h>

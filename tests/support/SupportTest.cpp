@@ -110,8 +110,8 @@ TEST(TestImagesTest, TheGradientRepeatsNoPixelAcrossItsByteBoundaries) {
 }
 
 TEST(ImageCompareTest, ReportsHowManyHowFarAndWhere) {
-    TestImage const image = MakeGradient(10, 10);
-    TestImage changed = image;
+    Picture const image = MakeGradient(10, 10);
+    Picture changed = image;
     changed.At(3, 4)[3] = 155;
     changed.At(9, 9)[0] = 12;
     ImageDifference const difference = CompareImages(changed, image);

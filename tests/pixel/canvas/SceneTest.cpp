@@ -11,7 +11,7 @@ namespace {
 using Scenes::Scene;
 
 Drawing ToDrawing(Scene const& scene) {
-    return {TestImage(scene.width, scene.height), [&scene](IMKCanvas& canvas, Scenes::SceneStage& stage) {
+    return {Picture(scene.width, scene.height), [&scene](IMKCanvas& canvas, Scenes::SceneStage& stage) {
                 Scenes::DrawScene(scene, canvas, stage);
             }};
 }
@@ -47,7 +47,7 @@ INSTANTIATE_TEST_SUITE_P(All, SceneOnCpu,
 
 TEST_P(SceneTest, IsTheSameOnEveryWay) {
     Drawing const drawing = ToDrawing(GetScene());
-    TestImage const deferred = Draw(drawing);
+    Picture const deferred = Draw(drawing);
     ExpectSame(deferred, Draw(drawing, Way::Immediate), GetParam() + " immediate");
     // What a scene makes of the GPU's own it makes through the queue.
     if (GetScene().needsGpu) return;
@@ -66,7 +66,7 @@ TEST_P(SceneInStrips, LooksAsTheReferenceDrawsIt) {
     int const side = std::max(scene.width, scene.height);
     int const top = side - scene.height / 2;
     UseLargestSide(side);
-    ExpectLikeReference({TestImage(scene.width, top + scene.height),
+    ExpectLikeReference({Picture(scene.width, top + scene.height),
                          [&](IMKCanvas& canvas, Scenes::SceneStage& stage) {
                              canvas.PreTranslate(0, static_cast<float>(top));
                              Scenes::DrawScene(scene, canvas, stage);
@@ -82,9 +82,9 @@ class SceneInThreeStrips : public SceneTest {};
 
 TEST_P(SceneInThreeStrips, IsTheSameAsOnOne) {
     Drawing const drawing = ToDrawing(GetScene());
-    TestImage const whole = Draw(drawing);
+    Picture const whole = Draw(drawing);
     UseLargestSide(Scenes::GetSideForThreeStrips(GetScene()));
-    TestImage const strips = Draw(drawing);
+    Picture const strips = Draw(drawing);
     ReferencePicture const reference = DrawReference(drawing, Scenes::GetSideForThreeStrips(GetScene()));
     ExpectLike(reference, strips, GetParam() + " in three strips");
     // A source cut into strips does not blend over its cuts.

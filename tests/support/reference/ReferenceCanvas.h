@@ -84,8 +84,8 @@ private:
     void DrawShapes(std::vector<Shape> const& shapes, RectF const& extent, MKPaint const& paint,
                     bool arePieces = false);
     void DrawSegments(std::vector<PointF> const& points, MKPaint const& paint);
-    void DrawQuads(TestImage const& image, ReferenceBitmap const& bitmap,
-                   std::vector<BitmapQuad> const& quads, MKPaint const& paint, bool batch);
+    void DrawQuads(Picture const& image, ReferenceBitmap const& bitmap, std::vector<BitmapQuad> const& quads,
+                   MKPaint const& paint, bool batch);
 
     ReferenceBitmap& mTarget;
     int const mStripHeight;

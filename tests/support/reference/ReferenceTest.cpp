@@ -84,8 +84,8 @@ TEST(ReferenceCoverage, LinesEndInTheirCapsAndDashes) {
 }
 
 TEST(ReferenceSlack, AllowsEachPixelItsOwn) {
-    TestImage const a(4, 4);
-    TestImage b = a;
+    Picture const a(4, 4);
+    Picture b = a;
     b.SetColor(1, 0, {0, 0, 9, 0});
     b.SetColor(2, 3, {3, 0, 0, 5});
     Slack slack(4, 4);
@@ -130,7 +130,7 @@ TEST(ReferenceClipSet, CutsStraightClipsTowardsZeroAndOthersAtPixelCentres) {
 }
 
 TEST(ReferenceCanvas, AllowsOneStepAndMoreOnlyWhereThePictureJumpsAtAPixelsCentre) {
-    ReferenceBitmap bitmap(TestImage(20, 20));
+    ReferenceBitmap bitmap(Picture(20, 20));
     ReferenceCanvas canvas(bitmap, {});
     Slack const& slack = canvas.GetSlack();
     MKPaint paint;

@@ -42,7 +42,7 @@ std::array<double, 2> PlaceInBand(double q, double c, double n) {
 
 } // namespace
 
-Rgba Sample(TestImage const& image, Sampler const& sampler, double u, double v) {
+Rgba Sample(Picture const& image, Sampler const& sampler, double u, double v) {
     auto const texel = [&](int x, int y) {
         return FromBytes(
             image.GetColor(WrapIndex(x, image.width, sampler.x), WrapIndex(y, image.height, sampler.y)));
@@ -53,7 +53,7 @@ Rgba Sample(TestImage const& image, Sampler const& sampler, double u, double v) 
                Mix(texel(x.low, y.low + 1), texel(x.low + 1, y.low + 1), x.between), y.between);
 }
 
-bool IsBetweenTexels(TestImage const& image, double u, double v) {
+bool IsBetweenTexels(Picture const& image, double u, double v) {
     auto const isBetween = [](double between) { return between > 1e-3 && between < 1 - 1e-3; };
     return isBetween(Locate(u, image.width).between) || isBetween(Locate(v, image.height).between);
 }

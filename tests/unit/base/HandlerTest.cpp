@@ -2,7 +2,7 @@
 #include "moka/base/MessageLoop.h"
 
 #include "moka/base/log/LogSink.h"
-#include "tests/unit/base/Allocation.h"
+#include "tests/support/Allocation.h"
 
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>

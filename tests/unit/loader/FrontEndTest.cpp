@@ -40,7 +40,7 @@ using FrontEnds = ::testing::Types<MKBitmapLoader, BitmapLoader>;
 TYPED_TEST_SUITE(EitherFrontEnd, FrontEnds, );
 
 TYPED_TEST(EitherFrontEnd, LogsAndCallsInBothKindsOfBuild) {
-    TestImage const image = MakeGradient(5, 4);
+    Picture const image = MakeGradient(5, 4);
     String const path = this->WritePicture("a.mki");
     String const missing = this->Path("missing.mki");
     String const bad = this->Path("bad.unknown");
@@ -212,7 +212,7 @@ TEST_F(FrontEnd, TheTwoKindsShareOneQueueAndOneThread) {
 }
 
 TEST_F(FrontEnd, BitmapsAreSavedAndTheLoaderFreesACpuBitmapsPixels) {
-    TestImage image = MakeAlphaPattern(20, 10);
+    Picture image = MakeAlphaPattern(20, 10);
     auto onGpu = MakeCallback<MKBitmapLoader>(listener);
     auto onCpu = MakeCallback<BitmapLoader>(listener);
     MKBitmapLoader graphics("graphics", &onGpu);

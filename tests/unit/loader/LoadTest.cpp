@@ -43,7 +43,7 @@ TEST_F(Load, PendingThenTheResultThenCompletedForEveryKind) {
 }
 
 TEST_F(Load, ATallPictureArrivesWholeAndTagged) {
-    TestImage const image = MakeGradient(7, 2 * kMaxSide + 9);
+    Picture const image = MakeGradient(7, 2 * kMaxSide + 9);
     String const path = WritePicture("tall.mki", image.width, image.height);
     RefPtr<IMKBitmap> kept;
     listener.whenLoaded = [&](Bitmap*, IMKBitmap* bitmap) { kept = RefPtr<IMKBitmap>::Share(bitmap); };

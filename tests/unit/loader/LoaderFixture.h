@@ -86,12 +86,12 @@ protected:
         return {std::istreambuf_iterator<char>(file), {}};
     }
 
-    static unsigned char* NewPixels(TestImage const& image) {
+    static unsigned char* NewPixels(Picture const& image) {
         auto* const pixels = new unsigned char[image.pixels.size()];
         std::copy(image.pixels.begin(), image.pixels.end(), pixels);
         return pixels;
     }
-    RefPtr<IMKBitmap> MakeBitmap(TestImage const& image) const {
+    RefPtr<IMKBitmap> MakeBitmap(Picture const& image) const {
         return RefPtr<IMKBitmap>::Adopt(MKGraphicsFactory::CreateBitmap(
             queue.get(), image.width, image.height, NewPixels(image), true, 1, false));
     }

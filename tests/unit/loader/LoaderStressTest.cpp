@@ -71,7 +71,7 @@ protected:
         }
     }
 
-    TestImage const image = MakeGradient(5, 4);
+    Picture const image = MakeGradient(5, 4);
     String path;
 };
 

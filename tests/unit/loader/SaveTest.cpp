@@ -2,8 +2,8 @@
 #include "tests/unit/loader/LoaderFixture.h"
 
 #include "moka/graphics/bitmap/MKBitmap.h"
+#include "tests/support/Allocation.h"
 #include "tests/support/Queues.h"
-#include "tests/unit/base/Allocation.h"
 
 #include <cstring>
 #include <limits>
@@ -39,7 +39,7 @@ protected:
         return ReadBytes("direct." + extension);
     }
 
-    TestImage image = MakeAlphaPattern(40, 30);
+    Picture image = MakeAlphaPattern(40, 30);
     RecordingListener listener;
 };
 
@@ -95,19 +95,19 @@ TEST_F(Save, WithoutAListenerTheFileIsWrittenAndWithoutPixelsItIsRefused) {
 }
 
 TEST_F(Save, WhatABitmapDoesNotCoverIsTransparent) {
-    TestImage const whole = MakeGradient(8, 8);
+    Picture const whole = MakeGradient(8, 8);
     auto const bitmap = RefPtr<IMKBitmap>::Adopt(
         MKGraphicsFactory::CreateBitmap(queue.get(), Rect(0, 2, 8, 5), 8, 8, whole.pixels.data(), 1));
     EXPECT_TRUE(Loader().RequestSave(&listener, 1, Path("s.png"), *bitmap, nullptr, 100));
     MKBitmapLoader::WaitForAllSaveRequestsToEnd(queue.get());
-    image = TestImage(8, 8);
+    image = Picture(8, 8);
     for (int y = 2; y < 5; ++y)
         for (int x = 0; x < 8; ++x) image.SetColor(x, y, whole.GetColor(x, y));
     EXPECT_EQ(ReadBytes("s.png"), EncodedDirectly("png"));
 }
 
 TEST_F(Save, WaitersWaitForTheReadBackAndTheFile) {
-    image = TestImage(4, 3);
+    image = Picture(4, 3);
     std::fill(image.pixels.begin(), image.pixels.end(), static_cast<unsigned char>(0xFF));
     HeldBitmap bitmap(4, 3);
     EXPECT_TRUE(Loader().RequestSave(&listener, 1, Path("s.png"), bitmap, nullptr, 100));
