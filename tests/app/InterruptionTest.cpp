@@ -94,9 +94,9 @@ TEST_F(InterruptionTest, WhileSavingLeavesWhatWasThere) {
 
 TEST_F(InterruptionTest, ASignalThatWasIgnoredStaysIgnored) {
     Save(MakeNoise(1000), "short.mki");
-    auto const before = std::signal(SIGHUP, SIG_IGN);
-    MokaProcess process(mFolder.string(), {"convert", "short.mki", "out.webp"});
-    std::signal(SIGHUP, before);
+    ProcessOptions options;
+    options.ignoredSignal = SIGHUP;
+    MokaProcess process(mFolder.string(), {"convert", "short.mki", "out.webp"}, options);
     ASSERT_TRUE(WaitFor([this] { return HasTemporary(); }));
     process.Signal(SIGHUP);
     EXPECT_EQ(process.Wait().status, 0);

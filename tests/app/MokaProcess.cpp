@@ -57,6 +57,8 @@ void MokaProcess::RunChild(std::vector<std::string> const& arguments, ProcessOpt
     dup2(out, STDOUT_FILENO);
     if (!options.in.empty()) dup2(open(options.in.c_str(), O_RDONLY), STDIN_FILENO);
     dup2(options.terminal >= 0 ? options.terminal : mErr, STDERR_FILENO);
+    for (int const number : {SIGINT, SIGTERM, SIGHUP})
+        std::signal(number, number == options.ignoredSignal ? SIG_IGN : SIG_DFL);
     if (chdir(mFolder.c_str()) != 0) _exit(126);
     if (options.fileSizeLimit > 0) {
         auto const limit = static_cast<rlim_t>(options.fileSizeLimit);
