@@ -118,7 +118,7 @@ TEST_F(Save, WaitersWaitForTheReadBackAndTheFile) {
             EXPECT_TRUE(Exists("s.png"));
             EXPECT_EQ(listener.GetEvents().size(), 3u);
         });
-    while (log.Count(ANDROID_LOG_INFO, "SaveTaskRunning -> Start Wait") < 3) std::this_thread::yield();
+    log.AwaitLines("SaveTaskRunning -> Start Wait", 3);
     EXPECT_TRUE(log.Has("WaitForAllSaveRequestsToEnd - SaveTaskRunning -> Start Wait, "
                         "mPendingSaveRequestList->GetCount() = 1, mQueue->GetCount() = 0, "
                         "mSaveTaskRunning = 0"));
