@@ -6,12 +6,10 @@
 namespace Moka::Testing {
 namespace {
 
-MKPaint Given(MKPaint const* paint) { return paint ? *paint : MKPaint(); }
-
 // Bitmaps of other kinds have their pixels where the reference cannot reach them.
 ReferenceBitmap* Find(IMKBitmap* bitmap) { return dynamic_cast<ReferenceBitmap*>(bitmap); }
 
-// Right and bottom are the size, wherever the bitmap lies; relied upon.
+// Right and bottom are the size, wherever the bitmap lies, which callers see.
 RectF WholeOf(IMKBitmap const& bitmap) {
     return {static_cast<float>(bitmap.GetX()), static_cast<float>(bitmap.GetY()),
             static_cast<float>(bitmap.GetWidth()), static_cast<float>(bitmap.GetHeight())};
@@ -39,7 +37,7 @@ BitmapQuad MakeQuad(RectF const& bounds, RectF const& src, RectF const& dst, boo
     auto const width = static_cast<double>(bounds.GetWidth());
     auto const height = static_cast<double>(bounds.GetHeight());
     auto const part = [](float value, double size) { return static_cast<double>(value) / size; };
-    // The right edge adds where the left one subtracts; relied upon.
+    // The right edge adds where the left one subtracts, which callers see.
     return {dst,
             part(src.left - bounds.left, width),
             part(src.top - bounds.top, height),
