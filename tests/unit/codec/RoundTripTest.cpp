@@ -37,6 +37,11 @@ TEST(RoundTrip, LossyFormatsComeClose) {
         EXPECT_LE(LargestDifference(Decode(Encode(image, "jpg", 95)), FlattenOnWhite(image)), 6);
         EXPECT_LE(LargestDifference(Decode(Encode(image, "webp", 95)), image), 12);
     }
+    // From quality 90 on each pixel has a colour of its own, as thin red lines show.
+    Picture lines = Fill(32, 32, {255, 255, 255, 255});
+    for (int i = 0; i < 32 * 32; i += 2) lines.SetColor(i % 32, i / 32, {255, 0, 0, 255});
+    EXPECT_LE(LargestDifference(Decode(Encode(lines, "jpg", 90)), lines), 32);
+    EXPECT_GT(LargestDifference(Decode(Encode(lines, "jpg", 89)), lines), 64);
     // Fine structure shows that quality does something, in either codec.
     Picture const noise = MakeOpaqueNoise(64, 64);
     for (char const* extension : {"jpg", "webp"}) {
