@@ -54,33 +54,27 @@ protected:
     Testing::LogCapture log;
 };
 
-TEST_F(HandlerTest, MessagesOfAllHandlersRunInTheOrderTheyWereSent) {
+TEST_F(HandlerTest, MessagesOfAllHandlersRunInTheOrderTheyWereSentAndWaitUntilThen) {
     MessageLoop loop;
     std::vector<std::pair<char, int>> order;
-    Receiver const a([&](Handler*, int what) { order.emplace_back('a', what); });
+    std::optional<bool> whileRunning;
+    Receiver const a([&](Handler* handler, int what) {
+        order.emplace_back('a', what);
+        whileRunning = handler->HasMessage();
+    });
     Receiver const b([&](Handler*, int what) { order.emplace_back('b', what); });
+    EXPECT_FALSE(a->HasMessage());
     EXPECT_TRUE(a->SendMessage(1));
     EXPECT_TRUE(b->SendMessage(1));
     EXPECT_TRUE(a->SendMessage());
+    EXPECT_TRUE(a->HasMessage());
+    EXPECT_FALSE(a->HasMessage(5));
+    EXPECT_FALSE(b->HasMessage()) << "another handler's message";
     EXPECT_TRUE(order.empty()) << "only the loop runs messages";
     EXPECT_EQ(loop.RunPending(), 3);
     EXPECT_THAT(order, ElementsAre(std::make_pair('a', 1), std::make_pair('b', 1), std::make_pair('a', 0)));
-    EXPECT_EQ(loop.RunPending(), 0);
-}
-
-TEST_F(HandlerTest, HasMessageMeansWaitingToRun) {
-    MessageLoop loop;
-    Receiver const other;
-    std::optional<bool> whileRunning;
-    Receiver const coalesced([&](Handler* handler, int) { whileRunning = handler->HasMessage(); });
-    EXPECT_FALSE(coalesced->HasMessage());
-    coalesced->SendMessage();
-    EXPECT_TRUE(coalesced->HasMessage());
-    EXPECT_FALSE(coalesced->HasMessage(5));
-    EXPECT_FALSE(other->HasMessage()) << "another handler's message";
-    loop.RunPending();
     EXPECT_EQ(whileRunning, false) << "a result that arrives now needs a new message";
-    EXPECT_FALSE(coalesced->HasMessage());
+    EXPECT_EQ(loop.RunPending(), 0);
 }
 
 TEST_F(HandlerTest, WithoutItsLoopAHandlerRefusesEveryMessage) {
@@ -277,29 +271,23 @@ TEST_F(HandlerTest, DestructionElsewhereWaitsForTheRunningMessage) {
     EXPECT_THAT(receiver->GetReceived(), ElementsAre(0));
 }
 
-TEST_F(HandlerTest, HandlersMayComeAndGoWhileTheLoopIsBusy) {
-    for (int round = 0; round < 300; ++round) {
-        std::unique_ptr<Receiver> receiver;
-        LoopThread loop([&] { receiver = std::make_unique<Receiver>(); });
-        for (int i = 0; i < 20; ++i) (*receiver)->SendMessage(i);
-        if (round % 3 == 0) loop.Stop(); // the loop goes first
-        receiver.reset();                // a message that still ran would touch it
-    }
-}
-
 // The message can destroy the handler while the sender is still inside SendMessage.
-TEST_F(HandlerTest, AHandlerMayBeDestroyedByTheMessageBeingSent) {
-    for (int round = 0; round < 300; ++round) {
+TEST_F(HandlerTest, HandlersMayComeAndGoWhileTheLoopIsBusy) {
+    for (int round = 0; round < 600; ++round) {
         Awaited<bool> done;
         std::unique_ptr<Receiver> receiver;
-        LoopThread const loop([&] {
-            receiver = std::make_unique<Receiver>([&](Handler*, int) {
-                receiver->DestroyHandler();
+        LoopThread loop([&] {
+            receiver = std::make_unique<Receiver>([&](Handler*, int what) {
+                if (what < 0) receiver->DestroyHandler();
                 done.Set(true);
             });
         });
-        EXPECT_TRUE((*receiver)->SendMessage());
+        bool const isDestroyedByMessage = round % 2 == 0;
+        for (int i = 0; i < (isDestroyedByMessage ? 1 : 20); ++i)
+            (*receiver)->SendMessage(isDestroyedByMessage ? -1 : i);
         done.AwaitAtLeast(true);
+        if (round % 3 == 0) loop.Stop(); // the loop goes first
+        receiver.reset();                // a message that still ran would touch it
     }
 }
 
