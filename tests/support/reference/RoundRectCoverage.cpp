@@ -39,15 +39,15 @@ Shape Piece(RectF const& bounds, Function const& coverage) {
 // One straight side: profile gives the coverage at a distance inwards from the edge.
 template <class Function>
 void AddSides(std::vector<Shape>& shapes, Frame const& f, double from, double to, Function const& profile) {
-    auto const [l, t, right, b] = f.outer;
-    shapes.push_back(Piece(MakeRect(f.innerLeft, t + from, f.innerRight, t + to),
-                           [=](PointD const& p) { return Fragment{profile(p.y - t)}; }));
-    shapes.push_back(Piece(MakeRect(f.innerLeft, b - to, f.innerRight, b - from),
-                           [=](PointD const& p) { return Fragment{profile(b - p.y)}; }));
-    shapes.push_back(Piece(MakeRect(l + from, f.innerTop, l + to, f.innerBottom),
-                           [=](PointD const& p) { return Fragment{profile(p.x - l)}; }));
-    shapes.push_back(Piece(MakeRect(right - to, f.innerTop, right - from, f.innerBottom),
-                           [=](PointD const& p) { return Fragment{profile(right - p.x)}; }));
+    RectD const r = f.outer;
+    shapes.push_back(Piece(MakeRect(f.innerLeft, r.top + from, f.innerRight, r.top + to),
+                           [=](PointD const& p) { return Fragment{profile(p.y - r.top)}; }));
+    shapes.push_back(Piece(MakeRect(f.innerLeft, r.bottom - to, f.innerRight, r.bottom - from),
+                           [=](PointD const& p) { return Fragment{profile(r.bottom - p.y)}; }));
+    shapes.push_back(Piece(MakeRect(r.left + from, f.innerTop, r.left + to, f.innerBottom),
+                           [=](PointD const& p) { return Fragment{profile(p.x - r.left)}; }));
+    shapes.push_back(Piece(MakeRect(r.right - to, f.innerTop, r.right - from, f.innerBottom),
+                           [=](PointD const& p) { return Fragment{profile(r.right - p.x)}; }));
 }
 
 // 1 on the ellipse with these radii.
