@@ -124,7 +124,8 @@ TEST(SceneFormat, OperationsAreTheCanvassOwn) {
          [](auto& c, auto*, auto* photo) {
              std::vector<RectF> dsts; // row by row; they lie over each other
              for (int i = 0; i < 6; ++i) {
-                 auto const x = static_cast<float>(1 + 3 * (i % 3)), y = static_cast<float>(2 + 2 * (i / 3));
+                 int const column = i % 3, row = i / 3;
+                 auto const x = static_cast<float>(1 + 3 * column), y = static_cast<float>(2 + 2 * row);
                  dsts.emplace_back(x, y, x + 6, y + 7);
              }
              c.DrawBitmaps(photo, RectF(0, 1, 2, 3), dsts, nullptr);
