@@ -2,6 +2,7 @@
 #include "tests/unit/loader/LoaderFixture.h"
 
 #include "moka/graphics/bitmap/MKBitmap.h"
+#include "moka/graphics/loader/BitmapLoader.h"
 #include "tests/support/Allocation.h"
 #include "tests/support/Queues.h"
 
@@ -128,6 +129,13 @@ TEST_F(Save, WaitersWaitForTheReadBackAndTheFile) {
     gate.Open();
     for (std::thread& waiter : waiters) waiter.join();
     EXPECT_EQ(ReadBytes("s.png"), EncodedDirectly("png"));
+}
+
+TEST_F(Save, WaitingForAllRunsTheRenderThreadsTasksFirst) {
+    HandPumpedQueue pumped;
+    MKBitmapLoader::WaitForAllSaveRequestsToEnd(&pumped);
+    BitmapLoader::WaitForAllSaveRequestsToEnd(&pumped);
+    EXPECT_EQ(pumped.GetWaitCount(), 2);
 }
 
 // Pending, waiting in the queue, and being encoded.
