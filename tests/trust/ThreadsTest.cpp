@@ -98,6 +98,7 @@ protected:
                     if (random() % 4 == 0) loader.CancelLoadRequest(id / 2);
                     if (random() % 16 == 0) loader.CancelAllLoadRequest();
                     if (random() % 16 == 0) loader.WaitForCallback();
+                    if (random() % 4 == 0) Loader::WaitForAllSaveRequestsToEnd(&queue);
                 }
                 if (round % 2 == 0) MKBitmapLoader::WaitUntilMsgQueueRequired();
             }

@@ -85,6 +85,8 @@ TEST(SceneRegistry, NothingTheLibraryKnowsIsLeftOut) {
 }
 
 TEST(ScenePictures, ArePremultipliedAtEverySizeDownToOnePixel) {
+    EXPECT_EQ(Scenes::MakePicture(1, 8, 8).GetColor(0, 0),
+              (Color{236, 239, 244, 255})); // a light square, opaque
     for (std::size_t kind = 0; kind < Scenes::GetPictureNames().size(); ++kind) {
         for (auto const& [width, height] : {std::pair{1, 1}, {1, 7}, {200, 3}, {61, 67}}) {
             Picture const picture = Scenes::MakePicture(kind, width, height);
