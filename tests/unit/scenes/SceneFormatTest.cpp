@@ -174,13 +174,18 @@ TEST(SceneFormat, PaintsCarryEveryPropertyAndBuildOnEachOther) {
     ExpectDraws(
         R"({"DrawCircle": {"cx": 11, "cy": 12, "radius": 9, "paint": {"base": "pen", "style": "FillAndStroke"}}})",
         [&](auto& c, auto*...) { c.DrawCircle(11, 12, 9, &pen); }, paints);
+    MKPaint tinted;
+    tinted.SetTintColor(static_cast<int>(0x8000FF00));
+    tinted.SetXFermode(MKPaint::DstOut);
+    ExpectDraws(
+        R"({"DrawBitmap": {"bitmap": "checker", "dst": [1, 2, 38, 29],
+                           "paint": {"tintColor": "#8000FF00", "xfermode": "DstOut"}}})",
+        [&](auto& c, auto* b, auto*) { c.DrawBitmap(b, RectF(1, 2, 38, 29), &tinted); });
     MKPaint tiled;
-    tiled.SetTintColor(static_cast<int>(0xFF00FF00));
-    tiled.SetXFermode(MKPaint::DstOut);
     tiled.SetTileMode(MKPaint::Mirror, MKPaint::Repeat);
     ExpectDraws(
-        R"({"DrawBitmap": {"bitmap": "checker", "src": [0, 0, 30, 40], "dst": [1, 2, 38, 29], "paint":
-            {"tintColor": "#00FF00", "xfermode": "DstOut", "tileMode": ["Mirror", "Repeat"]}}})",
+        R"({"DrawBitmap": {"bitmap": "checker", "src": [0, 0, 30, 40], "dst": [1, 2, 38, 29],
+                           "paint": {"tileMode": ["Mirror", "Repeat"]}}})",
         [&](auto& c, auto* b, auto*) { c.DrawBitmap(b, RectF(0, 0, 30, 40), RectF(1, 2, 38, 29), &tiled); });
     MKPaint numbered;
     numbered.SetXFermode(MKPaint::SrcKeepDstAlpha);
