@@ -119,16 +119,16 @@ TEST(SceneFormat, OperationsAreTheCanvassOwn) {
          }},
         {R"({"DrawBitmaps": {"bitmap": "photo", "dsts": [[1, 2, 30, 4]]}})",
          [](auto& c, auto*, auto* photo) { c.DrawBitmaps(photo, {RectF(1, 2, 30, 4)}, nullptr); }},
-        {R"({"DrawBitmaps": {"bitmap": "photo", "src": [0, 1, 2, 3],
-                "dsts": {"columns": 3, "rows": 2, "from": [1, 2], "step": [3, 2], "size": [6, 7]}}})",
-         [](auto& c, auto*, auto* photo) {
+        {R"({"DrawBitmaps": {"bitmap": "checker", "src": [1, 0, 12, 10],
+                "dsts": {"columns": 3, "rows": 2, "from": [1, 2], "step": [9, 8], "size": [20, 18]}}})",
+         [](auto& c, auto* b, auto*) {
              std::vector<RectF> dsts; // row by row; they lie over each other
              for (int i = 0; i < 6; ++i) {
                  int const column = i % 3, row = i / 3;
-                 auto const x = static_cast<float>(1 + 3 * column), y = static_cast<float>(2 + 2 * row);
-                 dsts.emplace_back(x, y, x + 6, y + 7);
+                 auto const x = static_cast<float>(1 + 9 * column), y = static_cast<float>(2 + 8 * row);
+                 dsts.emplace_back(x, y, x + 20, y + 18);
              }
-             c.DrawBitmaps(photo, RectF(0, 1, 2, 3), dsts, nullptr);
+             c.DrawBitmaps(b, RectF(1, 0, 12, 10), dsts, nullptr);
          }},
     };
     for (auto const& [operations, calls] : cases) ExpectDraws(operations, calls);
@@ -171,8 +171,9 @@ TEST(SceneFormat, PaintsCarryEveryPropertyAndBuildOnEachOther) {
                          "paint": {"base": "dashed", "dashedLinePattern": [1, 2, 3, 4]}}})",
         [&](auto& c, auto*...) { c.DrawLine(3, 3, 35, 25, &dashed); }, paints);
     pen.SetStyle(MKPaint::FillAndStroke);
+    pen.SetAlpha(0.25f); // in the place of the colour's
     ExpectDraws(
-        R"({"DrawCircle": {"cx": 11, "cy": 12, "radius": 9, "paint": {"base": "pen", "style": "FillAndStroke"}}})",
+        R"({"DrawCircle": {"cx": 11, "cy": 12, "radius": 9, "paint": {"base": "pen", "style": "FillAndStroke", "alpha": 0.25}}})",
         [&](auto& c, auto*...) { c.DrawCircle(11, 12, 9, &pen); }, paints);
     MKPaint tinted;
     tinted.SetTintColor(static_cast<int>(0x8000FF00));

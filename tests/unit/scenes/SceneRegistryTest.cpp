@@ -1,7 +1,12 @@
 // The scenes that come with the library: whole, well-formed, and complete.
+#include "moka/renderer/RendererFactory.h"
 #include "scenes/Picture.h"
 #include "scenes/SceneError.h"
+#include "scenes/SceneRenderer.h"
 #include "scenes/SceneTexts.h"
+#include "tests/support/LogCapture.h"
+#include "tests/support/Queues.h"
+#include "tests/support/RendererTrace.h"
 #include "tests/unit/scenes/ScenePainting.h"
 
 #include <algorithm>
@@ -48,6 +53,9 @@ TEST(SceneRegistry, CustomDrawablesAndInkAreRefusedWhereThereIsNoGpu) {
 }
 
 TEST(SceneRegistry, TallScenesHaveExactlyThreeStrips) {
+    Scene odd;
+    odd.height = 31;
+    EXPECT_EQ(GetSideForThreeStrips(odd), 11);
     int count = 0;
     for (Scene const& scene : GetScenes()) {
         if (!scene.alsoInStrips) continue;
@@ -82,6 +90,19 @@ TEST(SceneRegistry, NothingTheLibraryKnowsIsLeftOut) {
     for (std::string const x : {"Clamp", "Mirror", "Repeat"})
         for (std::string const y : {"Clamp", "Mirror", "Repeat"})
             EXPECT_EQ(CountOf("bitmap-tiles", "\"tileMode\": [\"" + x + "\", \"" + y + "\"]"), 1) << x << y;
+}
+
+TEST(SceneRenderer, WithoutRoomForItsPictureItThrows) {
+    RendererTrace::Reset();
+    ASSERT_TRUE(RendererFactory::AttachContext());
+    {
+        LogCapture const quiet;
+        HandPumpedQueue queue;
+        RendererTrace::FailCreations(ObjectKind::kTexture);
+        EXPECT_THROW(RenderScene(*Scenes::FindScene("rect-fractions"), queue), Scenes::SceneError);
+    }
+    RendererFactory::DetachContext();
+    RendererTrace::Reset();
 }
 
 TEST(ScenePictures, ArePremultipliedAtEverySizeDownToOnePixel) {
