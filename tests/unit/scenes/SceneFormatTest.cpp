@@ -120,13 +120,13 @@ TEST(SceneFormat, OperationsAreTheCanvassOwn) {
         {R"({"DrawBitmaps": {"bitmap": "photo", "dsts": [[1, 2, 30, 4]]}})",
          [](auto& c, auto*, auto* photo) { c.DrawBitmaps(photo, {RectF(1, 2, 30, 4)}, nullptr); }},
         {R"({"DrawBitmaps": {"bitmap": "checker", "src": [1, 0, 12, 10],
-                "dsts": {"columns": 3, "rows": 2, "from": [1, 2], "step": [9, 8], "size": [20, 18]}}})",
+                "dsts": {"columns": 3, "rows": 2, "from": [1, 14], "step": [9, 4], "size": [20, 9]}}})",
          [](auto& c, auto* b, auto*) {
              std::vector<RectF> dsts; // row by row; they lie over each other
              for (int i = 0; i < 6; ++i) {
                  int const column = i % 3, row = i / 3;
-                 auto const x = static_cast<float>(1 + 9 * column), y = static_cast<float>(2 + 8 * row);
-                 dsts.emplace_back(x, y, x + 20, y + 18);
+                 auto const x = static_cast<float>(1 + 9 * column), y = static_cast<float>(14 + 4 * row);
+                 dsts.emplace_back(x, y, x + 20, y + 9);
              }
              c.DrawBitmaps(b, RectF(1, 0, 12, 10), dsts, nullptr);
          }},
