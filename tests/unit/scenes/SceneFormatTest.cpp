@@ -119,16 +119,18 @@ TEST(SceneFormat, OperationsAreTheCanvassOwn) {
          }},
         {R"({"DrawBitmaps": {"bitmap": "photo", "dsts": [[1, 2, 30, 4]]}})",
          [](auto& c, auto*, auto* photo) { c.DrawBitmaps(photo, {RectF(1, 2, 30, 4)}, nullptr); }},
-        {R"({"DrawBitmaps": {"bitmap": "checker", "src": [1, 0, 12, 10],
+        {R"({"DrawBitmaps": {"bitmap": "checker", "src": [1, 0, 12, 10], "paint": {"alpha": 0.5},
                 "dsts": {"columns": 3, "rows": 2, "from": [1, 14], "step": [9, 4], "size": [20, 9]}}})",
          [](auto& c, auto* b, auto*) {
-             std::vector<RectF> dsts; // row by row; they lie over each other
+             std::vector<RectF> dsts; // row by row; they show through each other
+             MKPaint half;
+             half.SetAlpha(0.5f);
              for (int i = 0; i < 6; ++i) {
                  int const column = i % 3, row = i / 3;
                  auto const x = static_cast<float>(1 + 9 * column), y = static_cast<float>(14 + 4 * row);
                  dsts.emplace_back(x, y, x + 20, y + 9);
              }
-             c.DrawBitmaps(b, RectF(1, 0, 12, 10), dsts, nullptr);
+             c.DrawBitmaps(b, RectF(1, 0, 12, 10), dsts, &half);
          }},
     };
     for (auto const& [operations, calls] : cases) ExpectDraws(operations, calls);
