@@ -137,12 +137,12 @@ void ReadPixel(CanvasWorld& world) {
     Slot<IMKBitmap> const& slot = world.PickBitmap();
     Point const point(world.input.Int(), world.input.Int());
     bool const waits = world.input.Bool();
-    if (!slot.object) return;
-    ThreadScope const scope(slot.onRenderThread);
-    if (waits)
-        slot.object->GetPixel(point);
-    else
-        slot.object->GetPixelAsync(point, nullptr, [](unsigned int, void*) {});
+    Use(slot, [&](IMKBitmap& bitmap) {
+        if (waits)
+            bitmap.GetPixel(point);
+        else
+            bitmap.GetPixelAsync(point, nullptr, [](unsigned int, void*) {});
+    });
 }
 
 void ReadBlock(CanvasWorld& world) {
@@ -163,22 +163,20 @@ void SetSampling(CanvasWorld& world) {
     Slot<IMKBitmap> const& slot = world.PickBitmap();
     bool const filters = world.input.Bool();
     int const value = world.input.Below(4); // what the enumerations have room for
-    if (!slot.object) return;
-    ThreadScope const scope(slot.onRenderThread);
-    IMKBitmapReadable* const readable = slot.object->GetBitmapReadable();
-    if (!readable) return;
-    if (filters)
-        readable->SetTextureFilter(static_cast<TextureParamFilteringValue>(value & 1));
-    else
-        readable->SetTextureWrap(static_cast<TextureParamWrappingValue>(value));
+    Use(slot, [&](IMKBitmap& bitmap) {
+        IMKBitmapReadable* const readable = bitmap.GetBitmapReadable();
+        if (!readable) return;
+        if (filters)
+            readable->SetTextureFilter(static_cast<TextureParamFilteringValue>(value & 1));
+        else
+            readable->SetTextureWrap(static_cast<TextureParamWrappingValue>(value));
+    });
 }
 
 void TagBitmap(CanvasWorld& world) {
     Slot<IMKBitmap> const& slot = world.PickBitmap();
     std::string const tag(static_cast<std::size_t>(world.input.Byte()), 'x');
-    if (!slot.object) return;
-    ThreadScope const scope(slot.onRenderThread);
-    slot.object->SetTag(world.input.Bool() ? tag.c_str() : slot.object->GetTag());
+    Use(slot, [&](IMKBitmap& b) { b.SetTag(world.input.Bool() ? tag.c_str() : b.GetTag()); });
 }
 
 void FailACreation(CanvasWorld& world) { Testing::RendererTrace::FailCreation(1 + world.input.Below(16)); }

@@ -42,82 +42,39 @@ void DropCanvas(CanvasWorld& world) { world.PickCanvas().Drop(); }
 
 void DropPenCanvas(CanvasWorld& world) { world.PickPenCanvas().Drop(); }
 
-void ClearOrClip(IMKCanvasBase& canvas, FuzzInput& input) {
-    float const r = input.Float();
-    int const x = input.Int();
-    int const y = input.Int();
-    switch (input.Below(5)) {
-    case 0:
-        return canvas.Clear(x);
-    case 1:
-        return canvas.Clear(r, input.Float(), input.Float(), input.Float());
-    case 2:
-        return canvas.ClearAll(x);
-    case 3:
-        return canvas.ClearAll(r, input.Float(), input.Float(), input.Float());
-    default:
-        int const width = input.Int();
-        int const height = input.Int();
-        return canvas.SetClipRect(x, y, width, height, static_cast<IMKCanvasBase::ClipOp>(input.Int()));
-    }
-}
+using Step = void (*)(IMKCanvasBase& canvas, FuzzInput& input);
 
-void Transform(IMKCanvasBase& canvas, FuzzInput& input) {
-    int const operation = input.Below(10);
-    float const a = input.Float();
-    float const b = input.Float();
-    switch (operation) {
-    case 0:
-        return canvas.PreScale(a, b);
-    case 1:
-        return canvas.PostScale(a, b);
-    case 2:
-        return canvas.PreRotate(a);
-    case 3:
-        return canvas.PreRotate(a, b, input.Float());
-    case 4:
-        return canvas.PostRotate(a);
-    case 5:
-        return canvas.PostRotate(a, b, input.Float());
-    case 6:
-        return canvas.PreTranslate(a, b);
-    case 7:
-        return canvas.PostTranslate(a, b);
-    case 8:
-        return canvas.PreConcat(ReadMatrix(input));
-    default:
-        return canvas.PostConcat(ReadMatrix(input));
-    }
-}
-
-void ChangeState(IMKCanvasBase& canvas, FuzzInput& input) {
-    switch (input.Below(6)) {
-    case 0:
-        canvas.Save(static_cast<IMKCanvasBase::SaveFlag>(input.Int()));
-        return;
-    case 1:
-        return canvas.Restore(input.Int());
-    case 2:
-        return canvas.SetMatrix(ReadMatrix(input));
-    case 3:
-        return Transform(canvas, input);
-    case 4:
-        return canvas.SetTag(std::string(static_cast<std::size_t>(input.Byte()), 'x').c_str());
-    default:
-        return ClearOrClip(canvas, input);
-    }
-}
+Step const kSteps[] = {
+    [](auto& c, auto& i) { c.Clear(i.Int()); },
+    [](auto& c, auto& i) { c.Clear(i.Float(), i.Float(), i.Float(), i.Float()); },
+    [](auto& c, auto& i) { c.ClearAll(i.Int()); },
+    [](auto& c, auto& i) { c.ClearAll(i.Float(), i.Float(), i.Float(), i.Float()); },
+    [](auto& c, auto& i) {
+        c.SetClipRect(i.Int(), i.Int(), i.Int(), i.Int(), static_cast<IMKCanvasBase::ClipOp>(i.Int()));
+    },
+    [](auto& c, auto& i) { c.PreScale(i.Float(), i.Float()); },
+    [](auto& c, auto& i) { c.PostScale(i.Float(), i.Float()); },
+    [](auto& c, auto& i) { c.PreRotate(i.Float()); },
+    [](auto& c, auto& i) { c.PreRotate(i.Float(), i.Float(), i.Float()); },
+    [](auto& c, auto& i) { c.PostRotate(i.Float()); },
+    [](auto& c, auto& i) { c.PostRotate(i.Float(), i.Float(), i.Float()); },
+    [](auto& c, auto& i) { c.PreTranslate(i.Float(), i.Float()); },
+    [](auto& c, auto& i) { c.PostTranslate(i.Float(), i.Float()); },
+    [](auto& c, auto& i) { c.PreConcat(ReadMatrix(i)); },
+    [](auto& c, auto& i) { c.PostConcat(ReadMatrix(i)); },
+    [](auto& c, auto& i) { c.SetMatrix(ReadMatrix(i)); },
+    [](auto& c, auto& i) { c.Save(static_cast<IMKCanvasBase::SaveFlag>(i.Int())); },
+    [](auto& c, auto& i) { c.Restore(i.Int()); },
+    [](auto& c, auto& i) { c.SetTag(std::string(static_cast<std::size_t>(i.Byte()), 'x').c_str()); },
+};
 
 void ChangeCanvas(CanvasWorld& world) {
-    Slot<IMKCanvas> const& slot = world.PickCanvas();
-    ThreadScope const scope(slot.onRenderThread);
-    if (slot.object) ChangeState(*slot.object, world.input);
+    Use(world.PickCanvas(), [&](IMKCanvas& canvas) { DoOne(kSteps, world.input, canvas, world.input); });
 }
 
 void ChangePenCanvas(CanvasWorld& world) {
-    Slot<IMKPenCanvas> const& slot = world.PickPenCanvas();
-    ThreadScope const scope(slot.onRenderThread);
-    if (slot.object) ChangeState(*slot.object, world.input);
+    Use(world.PickPenCanvas(),
+        [&](IMKPenCanvas& canvas) { DoOne(kSteps, world.input, canvas, world.input); });
 }
 
 // As foreign code does it.

@@ -16,6 +16,7 @@
 #include "tests/support/RendererTrace.h"
 
 #include <array>
+#include <iterator>
 #include <memory>
 #include <vector>
 
@@ -89,6 +90,20 @@ private:
 
     std::vector<std::unique_ptr<unsigned char[]>> mBuffers;
 };
+
+// Does something with the slot's object, if there is one, on the thread that it belongs to.
+template <class T, class Action>
+void Use(Slot<T> const& slot, Action const& action) {
+    if (!slot.object) return;
+    ThreadScope const scope(slot.onRenderThread);
+    action(*slot.object);
+}
+
+// One of several steps, as the input's next byte says.
+template <class Steps, class... Arguments>
+void DoOne(Steps const& steps, FuzzInput& input, Arguments&... arguments) {
+    steps[input.Below(static_cast<int>(std::size(steps)))](arguments...);
+}
 
 // One operation out of the input's next bytes.
 using Operation = void (*)(CanvasWorld& world);

@@ -57,7 +57,7 @@ public:
     }
 
     explicit operator bool() const { return static_cast<bool>(mSlot.object); }
-    IMKCanvas* operator->() const { return mSlot.object.Get(); }
+    IMKCanvas* Get() const { return mSlot.object.Get(); }
     MKPaint const* GetPaint() const { return mHasPaint ? &mPaint : nullptr; }
     bool IsOnRenderThread() const { return mSlot.onRenderThread; }
 
@@ -70,66 +70,46 @@ private:
     bool mHasPaint = false;
 };
 
-void DrawLines(CanvasWorld& world) {
-    Draw draw(world);
-    if (!draw) return;
-    PointF const from = ReadPoint(draw.input);
-    PointF const to = ReadPoint(draw.input);
-    switch (draw.input.Below(3)) {
-    case 0:
-        return draw->DrawLine(from, to, draw.GetPaint());
-    case 1:
-        return draw->DrawSimpleLine(from, to, draw.GetPaint());
-    default:
-        return draw->DrawSimpleLines(ReadMany(draw.input, ReadPoint), draw.GetPaint());
-    }
-}
+using Shape = void (*)(IMKCanvas& canvas, FuzzInput& input, MKPaint const* paint);
+
+Shape const kShapes[] = {
+    [](auto& c, auto& i, auto* paint) { c.DrawLine(ReadPoint(i), ReadPoint(i), paint); },
+    [](auto& c, auto& i, auto* paint) { c.DrawSimpleLine(ReadPoint(i), ReadPoint(i), paint); },
+    [](auto& c, auto& i, auto* paint) { c.DrawSimpleLines(ReadMany(i, ReadPoint), paint); },
+    [](auto& c, auto& i, auto* paint) { c.DrawRect(ReadRectF(i), paint); },
+    [](auto& c, auto& i, auto* paint) { c.DrawRoundRect(ReadRectF(i), i.Float(), i.Float(), paint); },
+    [](auto& c, auto& i, auto* paint) { c.DrawCircle(i.Float(), i.Float(), i.Float(), paint); },
+};
 
 void DrawShape(CanvasWorld& world) {
     Draw draw(world);
-    if (!draw) return;
-    RectF const rect = ReadRectF(draw.input);
-    switch (draw.input.Below(3)) {
-    case 0:
-        return draw->DrawRect(rect, draw.GetPaint());
-    case 1:
-        return draw->DrawRoundRect(rect, draw.input.Float(), draw.input.Float(), draw.GetPaint());
-    default:
-        return draw->DrawCircle(rect.left, rect.top, rect.right, draw.GetPaint());
-    }
+    MKPaint const* const paint = draw.GetPaint();
+    if (draw) DoOne(kShapes, draw.input, *draw.Get(), draw.input, paint);
 }
+
+using Image = void (*)(IMKCanvas& canvas, FuzzInput& input, IMKBitmap* bitmap, MKPaint const* paint);
+
+Image const kImages[] = {
+    [](auto& c, auto& i, auto* bitmap, auto* paint) { c.DrawBitmap(bitmap, i.Float(), i.Float(), paint); },
+    [](auto& c, auto& i, auto* bitmap, auto* paint) { c.DrawBitmap(bitmap, ReadRectF(i), paint); },
+    [](auto& c, auto& i, auto* bitmap, auto* paint) {
+        c.DrawBitmap(bitmap, ReadRectF(i), ReadRectF(i), paint);
+    },
+    [](auto& c, auto& i, auto* bitmap, auto* paint) {
+        std::vector<PointF> points = ReadMany(i, ReadPoint);
+        c.DrawBitmaps(bitmap, points, paint);
+    },
+    [](auto& c, auto& i, auto* bitmap, auto* paint) { c.DrawBitmaps(bitmap, ReadMany(i, ReadRectF), paint); },
+    [](auto& c, auto& i, auto* bitmap, auto* paint) {
+        c.DrawBitmaps(bitmap, ReadRectF(i), ReadMany(i, ReadRectF), paint);
+    },
+};
 
 void DrawBitmap(CanvasWorld& world) {
     Draw draw(world);
-    IMKBitmap* const bitmap = world.PickBitmapFor(draw.IsOnRenderThread());
-    if (!draw) return;
-    RectF const src = ReadRectF(draw.input);
-    RectF const dst = ReadRectF(draw.input);
-    switch (draw.input.Below(3)) {
-    case 0:
-        return draw->DrawBitmap(bitmap, src.left, src.top, draw.GetPaint());
-    case 1:
-        return draw->DrawBitmap(bitmap, dst, draw.GetPaint());
-    default:
-        return draw->DrawBitmap(bitmap, src, dst, draw.GetPaint());
-    }
-}
-
-void DrawBitmaps(CanvasWorld& world) {
-    Draw draw(world);
-    IMKBitmap* const bitmap = world.PickBitmapFor(draw.IsOnRenderThread());
-    if (!draw) return;
-    RectF const src = ReadRectF(draw.input);
-    int const form = draw.input.Below(3);
-    if (form == 0) {
-        std::vector<PointF> points = ReadMany(draw.input, ReadPoint);
-        return draw->DrawBitmaps(bitmap, points, draw.GetPaint());
-    }
-    std::vector<RectF> const dsts = ReadMany(draw.input, ReadRectF);
-    if (form == 1)
-        draw->DrawBitmaps(bitmap, dsts, draw.GetPaint());
-    else
-        draw->DrawBitmaps(bitmap, src, dsts, draw.GetPaint());
+    IMKBitmap* bitmap = world.PickBitmapFor(draw.IsOnRenderThread());
+    MKPaint const* const paint = draw.GetPaint();
+    if (draw) DoOne(kImages, draw.input, *draw.Get(), draw.input, bitmap, paint);
 }
 
 IMKCustomDrawable* NewDrawable(CanvasWorld& world) {
@@ -174,14 +154,14 @@ void DropDrawable(CanvasWorld& world) { world.PickDrawable().Drop(); }
 void DrawDrawable(CanvasWorld& world) {
     IMKCustomDrawable* const drawable = world.PickDrawable().object.Get();
     Draw draw(world);
-    if (draw) draw->Draw(drawable, draw.GetPaint());
+    if (draw) draw.Get()->Draw(drawable, draw.GetPaint());
 }
 
 } // namespace
 
 std::vector<Operation> const& GetDrawOperations() {
-    static std::vector<Operation> const operations = {DrawLines,   DrawShape,    DrawShape,    DrawBitmap,
-                                                      DrawBitmaps, MakeDrawable, DropDrawable, DrawDrawable};
+    static std::vector<Operation> const operations = {DrawShape,  DrawShape,    DrawShape,    DrawBitmap,
+                                                      DrawBitmap, MakeDrawable, DropDrawable, DrawDrawable};
     return operations;
 }
 

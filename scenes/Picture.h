@@ -1,12 +1,16 @@
-// Picture: an RGBA8, premultiplied image in memory, rows tightly packed, and pictures made by rule for scenes
-// to draw. These are the same on every machine: whole numbers only.
+// Picture: an RGBA8, premultiplied image in memory, rows tightly packed, first row first, and pictures made by
+// rule for scenes to draw. These are the same on every machine: whole numbers only.
 #pragma once
 
+#include <algorithm>
+#include <array>
 #include <cstddef>
 #include <string>
 #include <vector>
 
 namespace Moka::Scenes {
+
+using Color = std::array<unsigned char, 4>; // r, g, b, a; premultiplied
 
 struct Picture {
     Picture() = default;
@@ -15,14 +19,43 @@ struct Picture {
     std::size_t CountBytes() const {
         return static_cast<std::size_t>(width) * static_cast<std::size_t>(height) * 4;
     }
-    std::size_t GetStride() const { return static_cast<std::size_t>(width) * 4; }
-    unsigned char* At(int x, int y) {
-        return pixels.data() + static_cast<std::size_t>(y) * GetStride() + static_cast<std::size_t>(x) * 4;
+    int GetStride() const { return width * 4; } // bytes
+    unsigned char* At(int x, int y) { return pixels.data() + GetOffset(x, y); }
+    unsigned char const* At(int x, int y) const { return pixels.data() + GetOffset(x, y); }
+    Color GetColor(int x, int y) const {
+        Color color;
+        std::copy_n(At(x, y), 4, color.begin());
+        return color;
+    }
+    void SetColor(int x, int y, Color const& color) { std::copy_n(color.begin(), 4, At(x, y)); }
+
+    // The block that starts at (x, y), which must lie inside.
+    Picture Crop(int x, int y, int w, int h) const {
+        Picture part(w, h);
+        for (int row = 0; row < h && w > 0; ++row) std::copy_n(At(x, y + row), w * 4, part.At(0, row));
+        return part;
+    }
+    // A copy with part in the place of its own pixels from (x, y) on, which must lie inside.
+    Picture With(int x, int y, Picture const& part) const {
+        Picture result = *this;
+        for (int row = 0; row < part.height && part.width > 0; ++row)
+            std::copy_n(part.At(0, row), part.GetStride(), result.At(x, y + row));
+        return result;
+    }
+
+    friend bool operator==(Picture const& a, Picture const& b) {
+        return a.width == b.width && a.height == b.height && a.pixels == b.pixels;
     }
 
     int width = 0;
     int height = 0;
     std::vector<unsigned char> pixels;
+
+private:
+    std::size_t GetOffset(int x, int y) const {
+        return (static_cast<std::size_t>(y) * static_cast<std::size_t>(width) + static_cast<std::size_t>(x)) *
+               4;
+    }
 };
 
 // gradient  red grows to the right, green downwards; opaque

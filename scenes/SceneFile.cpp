@@ -98,7 +98,7 @@ Picture LoadPicture(BitmapPlan const& plan) {
     for (int y = 0; y < picture.height; ++y)
         std::memcpy(picture.At(0, y),
                     image->GetBuffer() + static_cast<std::ptrdiff_t>(image->GetStride()) * y,
-                    picture.GetStride());
+                    static_cast<std::size_t>(picture.GetStride()));
     return picture;
 }
 

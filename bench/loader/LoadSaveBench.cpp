@@ -55,8 +55,8 @@ RenderThread& Queue() {
 }
 
 // Light from one corner with sensor noise, as photographs compress.
-Testing::TestImage MakePhoto(unsigned seed) {
-    Testing::TestImage image(kSide, kSide);
+Testing::Picture MakePhoto(unsigned seed) {
+    Testing::Picture image(kSide, kSide);
     std::mt19937 random(seed);
     for (int y = 0; y < kSide; ++y) {
         for (int x = 0; x < kSide; ++x) {
@@ -76,11 +76,11 @@ public:
         mFolder = (std::filesystem::is_directory(memory) ? memory : std::filesystem::temp_directory_path()) /
                   ("moka_loader_bench_" + std::to_string(getpid()));
         std::filesystem::create_directories(mFolder);
-        Testing::TestImage photo = MakePhoto(1);
-        Testing::TestImage page = Testing::MakeInkPage(kSide, kSide);
+        Testing::Picture photo = MakePhoto(1);
+        Testing::Picture page = Testing::MakeInkPage(kSide, kSide);
         for (int i = 0; i < kPictures; ++i) {
             bool const isPhoto = i % 2 == 0;
-            Testing::TestImage& image = isPhoto ? photo : page;
+            Testing::Picture& image = isPhoto ? photo : page;
             mInputs.emplace_back((mFolder / (std::to_string(i) + (isPhoto ? ".jpg" : ".png"))).string());
             mOutputs.emplace_back((mFolder / ("out" + std::to_string(i) + "." + extension)).string());
             Bitmap bitmap;

@@ -209,7 +209,7 @@ BENCHMARK(QueueAndCancelAll)
 class PictureFile {
 public:
     PictureFile() {
-        Testing::TestImage image = Testing::MakeInkPage(2048, 2048);
+        Testing::Picture image = Testing::MakeInkPage(2048, 2048);
         Bitmap bitmap;
         bitmap.Construct(image.pixels.data(), image.width, image.height, image.GetStride(), 1, false, false);
         if (!BitmapFactory::SaveBitmap(&bitmap, &mPath, 100)) std::abort();

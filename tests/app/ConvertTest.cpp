@@ -37,7 +37,7 @@ TEST_F(ConvertTest, QualityReachesTheEncoder) {
 }
 
 TEST_F(ConvertTest, ADashIsStandardInputAndOutput) {
-    TestImage const image = MakeAlphaPattern(61, 47);
+    Picture const image = MakeAlphaPattern(61, 47);
     Save(image, "in.webp");
     ProcessOptions options;
     options.in = Path("in.webp");
@@ -66,7 +66,7 @@ TEST_F(ConvertTest, TellsWhatItDidUnlessQuiet) {
     EXPECT_THAT(told, HasSubstr(std::to_string(ReadFile("out.mki").size()) + " bytes), 1 strip, "));
     EXPECT_THAT(RunWell({"convert", "in.png", "out.mki", "--size", "15x10"}), HasSubstr("(mki 15x10, "));
     EXPECT_EQ(RunWell({"convert", "in.png", "out.mki", "-q"}), "");
-    TestImage const tall = MakeGradient(64, 321);
+    Picture const tall = MakeGradient(64, 321);
     Save(tall, "tall.webp");
     std::filesystem::rename(Path("tall.webp"), Path("tall.jpg")); // content decides
     EXPECT_THAT(RunWell({"convert", "tall.jpg", "tall.mki", "--max-texture", "64"}),

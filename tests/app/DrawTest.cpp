@@ -34,7 +34,7 @@ TEST_F(DrawTest, DrawsWhatTheFileSaysInEveryFormat) {
             {"DrawBitmap": {"bitmap": "part", "x": 24, "y": 2}},
             {"Group": {"clip": [0, 0, 2, 20], "operations": [{"Clear": {"color": [0, 0, 0, 0]}}]}}]})");
     EXPECT_EQ(RunWell({"draw", "scenes/s.json", "-o", "out.png"}), "scenes/s.json -> out.png (30x20)\n");
-    TestImage const image = Load("out.png");
+    Picture const image = Load("out.png");
     ASSERT_EQ(image.width, 30);
     EXPECT_THAT(image.GetColor(9, 5), ElementsAre(0x10, 0x20, 0x30, 255));
     EXPECT_THAT(image.GetColor(10, 5), ElementsAre(255, 128, 0, 255));
@@ -55,7 +55,7 @@ TEST_F(DrawTest, DrawsWhatTheFileSaysInEveryFormat) {
 TEST_F(DrawTest, DrawsTheExamplesOfTheDocuments) {
     WriteFile("example.json", ReadExample("docs/scene-format.md"));
     RunWell({"draw", "example.json", "-o", "example.png"});
-    TestImage const image = Load("example.png");
+    Picture const image = Load("example.png");
     EXPECT_THAT(image.GetColor(4, 4), ElementsAre(0xF7, 0xF5, 0xF0, 255));    // the background
     EXPECT_THAT(image.GetColor(30, 200), ElementsAre(255, 255, 255, 255));    // the card
     EXPECT_THAT(image.GetColor(19, 120), ElementsAre(0x2A, 0x4A, 0x6A, 255)); // its frame
@@ -66,7 +66,7 @@ TEST_F(DrawTest, DrawsTheExamplesOfTheDocuments) {
 
     WriteFile("readme.json", ReadExample("README.md"));
     RunWell({"draw", "readme.json", "-o", "readme.png"});
-    TestImage const petals = Load("readme.png");
+    Picture const petals = Load("readme.png");
     EXPECT_THAT(petals.GetColor(160, 120), ElementsAre(0xF7, 0xF5, 0xF0, 255)); // between the petals
     EXPECT_NE(petals.GetColor(250, 120), petals.GetColor(160, 120));
 }

@@ -39,7 +39,7 @@ constexpr Bound kBounds[] = {
 // picture: where an edge, a ramp or the seam between two pieces of a round rectangle may be found.
 Slack FindAllowed(Scene const& scene) {
     auto const bitmap =
-        RefPtr<ReferenceBitmap>::Adopt(new ReferenceBitmap(TestImage(scene.width, scene.height)));
+        RefPtr<ReferenceBitmap>::Adopt(new ReferenceBitmap(Picture(scene.width, scene.height)));
     auto const canvas = RefPtr<ReferenceCanvas>::Adopt(new ReferenceCanvas(*bitmap, {4096, kSubpixelBits}));
     ReferenceStage stage;
     if (!scene.needsGpu) DrawScene(scene, *canvas, stage);
@@ -54,7 +54,7 @@ Slack FindAllowed(Scene const& scene) {
     return allowed;
 }
 
-int CountOver(TestImage const& a, TestImage const& b, int steps) {
+int CountOver(Picture const& a, Picture const& b, int steps) {
     Slack same(a.width, a.height);
     for (int y = 0; y < a.height; ++y) {
         for (int x = 0; x < a.width; ++x) same.Set(x, y, steps);
@@ -74,8 +74,8 @@ protected:
     }
 
     void Compare(Scene const& scene) {
-        TestImage const mesa = Load("mesa/" + scene.name + ".mki");
-        TestImage const angle = Load("angle/" + scene.name + ".mki");
+        Picture const mesa = Load("mesa/" + scene.name + ".mki");
+        Picture const angle = Load("angle/" + scene.name + ".mki");
         ASSERT_EQ(mesa.width, scene.width) << scene.name; // the tool has written it
         Slack const allowed = FindAllowed(scene);
         ImageDifference const left = CompareImages(mesa, angle, &allowed);

@@ -47,11 +47,11 @@ TEST_F(GalleryTest, EverySceneIsAPictureOnThePageAndOnDisk) {
     for (Scenes::Scene const& scene : Scenes::GetScenes()) {
         SCOPED_TRACE(scene.name);
         expected.insert(scene.name + ".png");
-        TestImage const image = Load("deep/gallery/" + scene.name + ".png");
+        Picture const image = Load("deep/gallery/" + scene.name + ".png");
         if (scene.alsoInStrips) {
             expected.insert(scene.name + "-in-strips.png");
             // All but what lies on an edge, and where a source's own strips meet.
-            TestImage const strips = Load("deep/gallery/" + scene.name + "-in-strips.png");
+            Picture const strips = Load("deep/gallery/" + scene.name + "-in-strips.png");
             EXPECT_LT(CompareImages(image, strips).differingPixels, image.width * image.height / 20);
         }
         EXPECT_EQ(image.width, scene.width);
@@ -84,8 +84,8 @@ TEST_F(GalleryTest, TheScreenLooksLikeATexture) {
     RunWell({"gallery", "--mki", "--out", ".", "--only", "screen", "clips"});
     EXPECT_THAT(List(), ElementsAre("clips-in-strips.mki", "clips.mki", "screen.mki"));
     RunWell({"draw", std::string(MOKA_SOURCE_FOLDER) + "/scenes/data/screen.json", "-o", "texture.mki"});
-    TestImage const screen = Load("screen.mki");
-    TestImage const texture = Load("texture.mki");
+    Picture const screen = Load("screen.mki");
+    Picture const texture = Load("texture.mki");
     EXPECT_LE(CompareImages(screen, texture).differingPixels, 12);
 }
 

@@ -1,12 +1,14 @@
 #include "tests/app/MokaProcess.h"
 
 #include <algorithm>
+#include <cerrno>
 #include <csignal>
 #include <cstdlib>
 #include <fcntl.h>
 #include <sys/mman.h>
 #include <sys/resource.h>
 #include <sys/wait.h>
+#include <system_error>
 #include <unistd.h>
 
 namespace Moka::Testing {
@@ -33,6 +35,7 @@ int ProcessResult::CountErrorLines() const {
 
 MokaProcess::MokaProcess(std::string folder, std::vector<std::string> arguments, ProcessOptions options)
     : mFolder(std::move(folder)), mOut(MakeCapture("out")), mErr(MakeCapture("err")), mPid(fork()) {
+    if (mPid < 0) throw std::system_error(errno, std::generic_category(), "no process can be started");
     if (mPid == 0) RunChild(arguments, options);
 }
 
@@ -56,6 +59,8 @@ void MokaProcess::RunChild(std::vector<std::string> const& arguments, ProcessOpt
     dup2(out, STDOUT_FILENO);
     if (!options.in.empty()) dup2(open(options.in.c_str(), O_RDONLY), STDIN_FILENO);
     dup2(options.terminal >= 0 ? options.terminal : mErr, STDERR_FILENO);
+    for (int const number : {SIGINT, SIGTERM, SIGHUP})
+        std::signal(number, number == options.ignoredSignal ? SIG_IGN : SIG_DFL);
     if (chdir(mFolder.c_str()) != 0) _exit(126);
     if (options.fileSizeLimit > 0) {
         auto const limit = static_cast<rlim_t>(options.fileSizeLimit);
@@ -66,7 +71,9 @@ void MokaProcess::RunChild(std::vector<std::string> const& arguments, ProcessOpt
     _exit(127);
 }
 
-void MokaProcess::Signal(int signal) const { kill(mPid, signal); }
+void MokaProcess::Signal(int signal) const {
+    if (mPid > 0) kill(mPid, signal); // -1 would reach every process
+}
 
 ProcessResult MokaProcess::Wait() {
     ProcessResult result;

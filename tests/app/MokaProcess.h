@@ -22,6 +22,7 @@ struct ProcessOptions {
     int terminal = -1;                    // a terminal to use as stderr; err then stays empty
     std::string out;                      // a file to use as stdout
     std::string in;                       // a file to use as stdin
+    int ignoredSignal = 0;                // all others have their defaults, whatever the test's own are
 };
 
 // A running tool. Ended, if it still runs, with this object.

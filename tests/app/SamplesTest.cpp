@@ -8,7 +8,7 @@ namespace {
 using SamplesTest = ToolTest;
 
 TEST_F(SamplesTest, ComparesEveryPixel) {
-    TestImage image = MakeGradient(30, 20);
+    Picture image = MakeGradient(30, 20);
     Save(image, "a.png");
     Save(image, "same.mki");
     image.SetColor(0, 0, {9, 9, 9, 255});

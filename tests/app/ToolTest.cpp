@@ -1,13 +1,8 @@
 #include "tests/app/ToolTest.h"
 
-#include "moka/base/BitmapFactory.h"
-#include "moka/base/String.h"
 #include "tests/support/ImageCompare.h"
 
 #include <algorithm>
-#include <cstring>
-#include <fstream>
-#include <iterator>
 
 namespace Moka::Testing {
 
@@ -19,33 +14,12 @@ ProcessOptions WithoutDriver() {
     return options;
 }
 
-void ToolTest::Save(TestImage const& image, std::string const& name, int quality) const {
+void ToolTest::Save(Picture const& image, std::string const& name, int quality) const {
     ASSERT_TRUE(SaveImage(image, Path(name), quality));
-}
-
-void ToolTest::WriteFile(std::string const& name, std::string const& content) const {
-    std::ofstream(Path(name), std::ios::binary) << content;
-}
-
-std::string ToolTest::ReadFile(std::string const& name) const {
-    std::ifstream file(Path(name), std::ios::binary);
-    return {std::istreambuf_iterator<char>(file), {}};
 }
 
 void ToolTest::Truncate(std::string const& name) const {
     fs::resize_file(Path(name), fs::file_size(Path(name)) / 2);
-}
-
-TestImage ToolTest::Load(std::string const& name) const {
-    String const path = String::FromFileName(Path(name));
-    std::unique_ptr<Bitmap> const bitmap(BitmapFactory::CreateBitmapForGraphics(&path));
-    if (!bitmap) return {0, 0};
-    TestImage image(bitmap->GetWidth(), bitmap->GetHeight());
-    for (int y = 0; y < image.height; ++y)
-        std::memcpy(image.At(0, y),
-                    bitmap->GetBuffer() + static_cast<std::ptrdiff_t>(bitmap->GetStride()) * y,
-                    static_cast<std::size_t>(image.GetStride()));
-    return image;
 }
 
 std::vector<std::string> ToolTest::List(std::string const& folder) const {
@@ -88,8 +62,8 @@ void ToolTest::ExpectFails(std::vector<std::string> const& arguments, int status
     EXPECT_TRUE(look() == before);
 }
 
-void ToolTest::ExpectSamePixels(TestImage const& image, std::string const& name) const {
-    TestImage const written = Load(name);
+void ToolTest::ExpectSamePixels(Picture const& image, std::string const& name) const {
+    Picture const written = Load(name);
     ASSERT_GT(written.width, 0) << name;
     EXPECT_EQ(CompareImages(image, written).differingPixels, 0) << name;
 }

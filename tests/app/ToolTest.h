@@ -1,14 +1,12 @@
 // ToolTest.h: a folder for each test, pictures in it, and the tool at work there.
 #pragma once
 
-#include "moka/base/Bitmap.h"
 #include "tests/app/MokaProcess.h"
 #include "tests/support/TestFiles.h"
 
 #include <filesystem>
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
-#include <memory>
 #include <string>
 #include <vector>
 
@@ -24,13 +22,15 @@ class ToolTest : public ::testing::Test {
 protected:
     // Names are relative to the test's folder throughout.
     std::string Path(std::string const& name) const { return (mFolder / name).string(); }
-    void Save(TestImage const& image, std::string const& name, int quality = 100) const;
-    void WriteFile(std::string const& name, std::string const& content) const;
-    std::string ReadFile(std::string const& name) const;
+    void Save(Picture const& image, std::string const& name, int quality = 100) const;
+    void WriteFile(std::string const& name, std::string const& content) const {
+        Testing::WriteFile(Path(name), content);
+    }
+    std::string ReadFile(std::string const& name) const { return Testing::ReadFile(Path(name)); }
     // Cut off after half of its bytes.
     void Truncate(std::string const& name) const;
     // Empty when the file cannot be decoded.
-    TestImage Load(std::string const& name) const;
+    Picture Load(std::string const& name) const { return LoadImage(Path(name)); }
     // Sorted; everything, hidden files as well.
     std::vector<std::string> List(std::string const& folder = ".") const;
 
@@ -40,7 +40,7 @@ protected:
     // One line on stderr that holds every part, nothing on stdout, and the folder as it was.
     void ExpectFails(std::vector<std::string> const& arguments, int status,
                      std::vector<std::string> const& parts, ProcessOptions const& options = {}) const;
-    void ExpectSamePixels(TestImage const& image, std::string const& name) const;
+    void ExpectSamePixels(Picture const& image, std::string const& name) const;
 
 private:
     TempFolder mTemporary;

@@ -74,8 +74,8 @@ private:
     int mStatus = -1;
 };
 
-TestImage DrawWithoutWindow(int width, int height) {
-    TestImage image(width, height);
+Picture DrawWithoutWindow(int width, int height) {
+    Picture image(width, height);
     std::string error;
     auto const queue = RenderThread::Start({}, &error);
     EXPECT_TRUE(queue) << error;
@@ -100,7 +100,7 @@ bool Soon(Condition const& holds) {
 }
 
 // Edges may be rounded otherwise, since a window's rows lie the other way round in GL.
-bool IsSame(TestImage const& a, TestImage const& b) {
+bool IsSame(Picture const& a, Picture const& b) {
     ImageDifference const difference = CompareImages(a, b);
     return difference.largest <= 3;
 }
@@ -118,8 +118,8 @@ TEST(ExampleTest, ShowsThePictureAtEverySizeAndCloses) {
     };
     for (Size const size : {Size{320, 240}, Size{480, 360}, Size{220, 300}}) {
         window.Resize(size.width, size.height);
-        TestImage const expected = DrawWithoutWindow(size.width, size.height);
-        TestImage seen(1, 1);
+        Picture const expected = DrawWithoutWindow(size.width, size.height);
+        Picture seen(1, 1);
         EXPECT_TRUE(Soon([&] {
             if (window.Find(size.width, size.height)) seen = window.Grab(size.width, size.height);
             return program.IsOver() || IsSame(expected, seen);

@@ -39,8 +39,8 @@ bool ExampleWindow::Find(int width, int height) {
     return mWindow != 0;
 }
 
-TestImage ExampleWindow::Grab(int width, int height) const {
-    TestImage image(width, height);
+Picture ExampleWindow::Grab(int width, int height) const {
+    Picture image(width, height);
     XImage* const seen = XGetImage(ToX(mDisplay), mWindow, 0, 0, static_cast<unsigned>(width),
                                    static_cast<unsigned>(height), AllPlanes, ZPixmap);
     if (!seen) return image;

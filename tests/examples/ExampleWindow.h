@@ -18,7 +18,7 @@ public:
 
     // False while there is none.
     bool Find(int width, int height);
-    TestImage Grab(int width, int height) const;
+    Picture Grab(int width, int height) const;
     void Resize(int width, int height);
     // As a click on its frame's button does it.
     void Close();

@@ -1,7 +1,6 @@
 // Files decoded through Java: a Java factory that does what the test tells it, and Java bitmaps that fail
 // where they are told to.
 #include "moka/base/Bitmap.h"
-#include "moka/base/BitmapFactory.h"
 #include "moka/base/String.h"
 #include "moka/base/log/AndroidLog.h"
 #include "moka/graphics/bitmap/ImageDecoding.h"
@@ -9,9 +8,9 @@
 #include "tests/jvm/JavaFixture.h"
 #include "tests/jvm/PatchedFunctions.h"
 #include "tests/support/LogCapture.h"
+#include "tests/support/TestFiles.h"
 
 #include <cstring>
-#include <filesystem>
 #include <gmock/gmock.h>
 #include <memory>
 #include <string>
@@ -93,16 +92,7 @@ protected:
         return JavaFixture::MakeJavaBitmap({1, 2, 4, config, {10, 20, 30, 40, 0, 255, 1, 254}, failing});
     }
 
-    // A file that the base library reads, 3 x 2.
-    String SaveFile() {
-        Bytes pixels(3 * 2 * 4, 255);
-        Bitmap bitmap;
-        EXPECT_TRUE(bitmap.Construct(pixels.data(), 3, 2, 12, Bitmap::kFormatRgba8888, false, false));
-        String const path((std::filesystem::path(testing::TempDir()) / "bridge.webp").string());
-        EXPECT_TRUE(BitmapFactory::SaveBitmap(&bitmap, &path, 100));
-        return path;
-    }
-
+    TempFolder const mFolder;
     jclass mFactory = nullptr;
 };
 
@@ -199,7 +189,8 @@ TEST_F(DecodeBridge, AsksNobodyWithoutAPath) {
 
 TEST_F(DecodeBridge, WhatJavaCannotReadTheBaseLibraryReads) {
     Load();
-    String const good = SaveFile();
+    String const good(mFolder.Path("bridge.webp"));
+    ASSERT_TRUE(SaveImage(MakeGradient(3, 2), mFolder.Path("bridge.webp")));
     String const bad("/no/such.png");
     for (bool isThrowing : {false, true}) {
         SetThrowing(isThrowing);
@@ -223,19 +214,17 @@ TEST_F(DecodeBridge, WhatJavaCannotReadTheBaseLibraryReads) {
                             "MKBitmapFactory : recycle threw an exception"));
 }
 
-// On a thread that never returns to Java nobody else would end them; the VM's checks report when too many
-// gather.
+// On a thread that never returns to Java nobody else would end them.
 TEST_F(DecodeBridge, GathersNoLocalReferences) {
     Load();
     LogCapture const quiet;
-    jobject const results[] = {MakeJavaBitmap("ARGB_8888", ""), MakeJavaBitmap("ARGB_8888", "recycle"),
-                               MakeJavaBitmap("ALPHA_8", ""), nullptr};
     String const path("/no/such.jpg");
-    for (jobject result : results) {
+    for (jobject result : {MakeJavaBitmap("ARGB_8888", ""), MakeJavaBitmap("ARGB_8888", "recycle"),
+                           MakeJavaBitmap("ALPHA_8", ""), jobject{}}) {
         SetResult(result);
         for (bool isThrowing : {false, true}) {
             SetThrowing(isThrowing);
-            for (int i = 0; i < 200; ++i) BitmapOwner(CreateBitmapJNI(&path, 0, 0));
+            ExpectNoReferencesLeft([&] { BitmapOwner(CreateBitmapJNI(&path, 0, 0)); });
         }
     }
 }

@@ -2,7 +2,7 @@
 #include "moka/base/Bitmap.h"
 #include "moka/base/log/AndroidLog.h"
 #include "tests/jvm/JavaFixture.h"
-#include "tests/support/ArrayMemory.h"
+#include "tests/support/Allocation.h"
 #include "tests/support/LogCapture.h"
 
 #include <gmock/gmock.h>
@@ -13,21 +13,6 @@ namespace {
 
 using testing::HasSubstr;
 using Source = JavaPicture;
-
-jobject MakeObject(JNIEnv* env, char const* className) {
-    env->PushLocalFrame(4);
-    jclass const type = env->FindClass(className);
-    jobject const made = env->NewObject(type, env->GetMethodID(type, "<init>", "()V"));
-    EXPECT_FALSE(env->ExceptionCheck());
-    return env->PopLocalFrame(made);
-}
-
-void CollectGarbage(JNIEnv* env) {
-    jclass const type = env->FindClass("java/lang/System");
-    env->CallStaticVoidMethod(type, env->GetStaticMethodID(type, "gc", "()V"));
-    EXPECT_FALSE(env->ExceptionCheck());
-    env->DeleteLocalRef(type);
-}
 
 class JniBitmapTest : public JavaFixture {
 protected:
@@ -108,8 +93,8 @@ TEST_F(JniBitmapTest, RefusesWhatIsNotAnArgb8888Bitmap) {
     Source none;
     none.config = nullptr;
     ExpectRefusal(none, "no configuration, ARGB_8888 is needed");
-    ExpectRefusal(MakeObject(mEnv, "java/lang/Object"), "getConfig: java.lang.NoSuchMethodError");
-    ExpectRefusal(MakeObject(mEnv, "android/graphics/Bitmap$WithoutCopy"),
+    ExpectRefusal(MakeObject("java/lang/Object"), "getConfig: java.lang.NoSuchMethodError");
+    ExpectRefusal(MakeObject("android/graphics/Bitmap$WithoutCopy"),
                   "copyPixelsToBuffer: java.lang.NoSuchMethodError");
 }
 
@@ -205,24 +190,11 @@ TEST_F(JniBitmapTest, NoLocalReferenceIsLeftBehind) {
     Source failing;
     failing.failing = "copyPixelsToBuffer";
     jobject const good = MakeJavaBitmap();
-    jobject const bad = MakeJavaBitmap(failing);
-    for (jobject javaBitmap : {good, bad, jobject{}}) {
-        // The frame on top afterwards is the one that was before: with it goes what only it holds.
-        ASSERT_EQ(mEnv->PushLocalFrame(4), JNI_OK);
-        jweak const ours = mEnv->NewWeakGlobalRef(MakeObject(mEnv, "java/lang/Object"));
-        Bitmap bitmap;
-        EXPECT_EQ(JNI_ConvertJavaToBitmap(mEnv, javaBitmap, &bitmap, true), javaBitmap == good);
-        mEnv->PopLocalFrame(nullptr);
-        CollectGarbage(mEnv);
-        EXPECT_TRUE(mEnv->IsSameObject(ours, nullptr));
-        mEnv->DeleteWeakGlobalRef(ours);
-    }
-    // And what would gather outside of the conversion's own frame, the VM's checks report when the case ends.
-    for (int i = 0; i < 1000; ++i) {
-        Bitmap bitmap;
-        ASSERT_TRUE(JNI_ConvertJavaToBitmap(mEnv, good, &bitmap, true));
-        ASSERT_FALSE(JNI_ConvertJavaToBitmap(mEnv, bad, &bitmap, true));
-    }
+    for (jobject javaBitmap : {good, MakeJavaBitmap(failing), jobject{}})
+        ExpectNoReferencesLeft([&] {
+            Bitmap bitmap;
+            ASSERT_EQ(JNI_ConvertJavaToBitmap(mEnv, javaBitmap, &bitmap, true), javaBitmap == good);
+        });
 }
 
 } // namespace

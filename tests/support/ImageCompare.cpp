@@ -1,8 +1,6 @@
 #include "tests/support/ImageCompare.h"
 
-#include "moka/base/Bitmap.h"
-#include "moka/base/BitmapFactory.h"
-#include "moka/base/String.h"
+#include "tests/support/TestFiles.h"
 
 #include <algorithm>
 #include <cctype>
@@ -41,10 +39,10 @@ Color ShowDifference(unsigned char const* a, unsigned char const* b, int slack) 
     return {grey, grey, grey, 255};
 }
 
-bool WriteDifference(TestImage const& a, TestImage const& b, std::string const& path, Slack const* slack) {
+bool WriteDifference(Picture const& a, Picture const& b, std::string const& path, Slack const* slack) {
     int const width = std::min(a.width, b.width);
     int const height = std::min(a.height, b.height);
-    TestImage sheet(width * 3, height);
+    Picture sheet(width * 3, height);
     for (int y = 0; y < height; ++y) {
         for (int x = 0; x < width; ++x) {
             sheet.SetColor(x, y, OnWhite(a.At(x, y)));
@@ -53,13 +51,7 @@ bool WriteDifference(TestImage const& a, TestImage const& b, std::string const& 
             sheet.SetColor(x + 2 * width, y, OnWhite(b.At(x, y)));
         }
     }
-    Bitmap bitmap;
-    if (!bitmap.Construct(sheet.pixels.data(), sheet.width, sheet.height, sheet.GetStride(),
-                          Bitmap::kFormatRgba8888, false, false)) {
-        return false;
-    }
-    String const file(path);
-    return BitmapFactory::SaveBitmap(&bitmap, &file, 100);
+    return SaveImage(sheet, path);
 }
 
 } // namespace
@@ -90,14 +82,14 @@ ImageDifference CompareImages(unsigned char const* a, unsigned char const* b, in
     return result;
 }
 
-ImageDifference CompareImages(TestImage const& a, TestImage const& b, Slack const* slack) {
+ImageDifference CompareImages(Picture const& a, Picture const& b, Slack const* slack) {
     if (a.width == b.width && a.height == b.height) {
         return CompareImages(a.pixels.data(), b.pixels.data(), a.width, a.height, slack);
     }
     return {static_cast<int>(std::max(a.pixels.size(), b.pixels.size()) / 4), 255, 255, 0, 0};
 }
 
-std::string KeepDifference(TestImage const& expected, TestImage const& actual, std::string name,
+std::string KeepDifference(Picture const& expected, Picture const& actual, std::string name,
                            Slack const* slack) {
     for (char& c : name) {
         if (!std::isalnum(static_cast<unsigned char>(c))) c = '-';

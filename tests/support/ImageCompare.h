@@ -50,13 +50,13 @@ std::ostream& operator<<(std::ostream& stream, ImageDifference const& difference
 ImageDifference CompareImages(unsigned char const* a, unsigned char const* b, int width, int height,
                               Slack const* slack = nullptr);
 // Images of different sizes differ everywhere, by 255.
-ImageDifference CompareImages(TestImage const& a, TestImage const& b, Slack const* slack = nullptr);
+ImageDifference CompareImages(Picture const& a, Picture const& b, Slack const* slack = nullptr);
 
 // For a failed test: writes differences/NAME.png in the working directory, whatever characters the name
 // has, and returns a line that says where. It shows both images, on white, and between them their
 // difference: grey and dim where they agree, red by the largest channel difference (at least half bright)
 // where not, blue where they may.
-std::string KeepDifference(TestImage const& expected, TestImage const& actual, std::string name,
+std::string KeepDifference(Picture const& expected, Picture const& actual, std::string name,
                            Slack const* slack = nullptr);
 
 } // namespace Moka::Testing

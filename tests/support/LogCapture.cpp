@@ -6,18 +6,11 @@
 namespace Moka::Testing {
 
 LogCapture::LogCapture() {
-    mPrevious = SetLogSink([this](LogLine const& line) {
-        std::lock_guard<std::mutex> lock(mMutex);
-        mLines.push_back(line);
-    });
+    mPrevious = SetLogSink(
+        [this](LogLine const& line) { mLines.Update([&](auto& lines) { lines.push_back(line); }); });
 }
 
 LogCapture::~LogCapture() { SetLogSink(std::move(mPrevious)); }
-
-std::vector<LogLine> LogCapture::GetLines() const {
-    std::lock_guard<std::mutex> lock(mMutex);
-    return mLines;
-}
 
 std::vector<std::string> LogCapture::GetTexts(int priority) const {
     std::vector<std::string> texts;
@@ -43,15 +36,18 @@ int LogCapture::Count(int priority, std::string const& part) const {
 bool LogCapture::Has(std::string const& text) const { return Find(text).priority != 0; }
 
 LogLine LogCapture::Find(std::string const& text) const {
-    std::lock_guard<std::mutex> lock(mMutex);
-    auto const found =
-        std::find_if(mLines.begin(), mLines.end(), [&](LogLine const& line) { return line.text == text; });
-    return found == mLines.end() ? LogLine{} : *found;
+    for (LogLine const& line : GetLines()) {
+        if (line.text == text) return line;
+    }
+    return {};
 }
 
-void LogCapture::Clear() {
-    std::lock_guard<std::mutex> lock(mMutex);
-    mLines.clear();
+void LogCapture::AwaitLines(std::string const& part, int count) const {
+    Await([&](std::vector<LogLine> const& lines) {
+        return count <= std::count_if(lines.begin(), lines.end(), [&](LogLine const& line) {
+                   return line.text.find(part) != std::string::npos;
+               });
+    });
 }
 
 } // namespace Moka::Testing

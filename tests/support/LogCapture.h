@@ -4,8 +4,8 @@
 #pragma once
 
 #include "moka/base/log/LogSink.h"
+#include "tests/support/Awaited.h"
 
-#include <mutex>
 #include <string>
 #include <vector>
 
@@ -18,7 +18,7 @@ public:
     LogCapture(LogCapture const&) = delete;
     LogCapture& operator=(LogCapture const&) = delete;
 
-    std::vector<LogLine> GetLines() const;
+    std::vector<LogLine> GetLines() const { return mLines.Get(); }
     // The texts of one priority, or of all; for comparing with what is expected.
     std::vector<std::string> GetTexts(int priority) const;
     std::vector<std::string> GetTexts() const;
@@ -30,11 +30,18 @@ public:
     // The first line with exactly this text, for its tag, format and priority; priority 0 when there is none.
     LogLine Find(std::string const& text) const;
 
-    void Clear();
+    // Until the lines so far fulfil the condition, which is asked under the lock and must not log.
+    template <class Condition>
+    void Await(Condition const& condition) const {
+        mLines.Await(condition);
+    }
+    // Until so many lines contain part.
+    void AwaitLines(std::string const& part, int count = 1) const;
+
+    void Clear() { mLines.Set({}); }
 
 private:
-    std::mutex mutable mMutex;
-    std::vector<LogLine> mLines;
+    Awaited<std::vector<LogLine>> mLines;
     LogSink mPrevious;
 };
 

@@ -6,6 +6,9 @@
 
 #include <algorithm>
 #include <cstdlib>
+#include <fstream>
+#include <iterator>
+#include <memory>
 
 namespace Moka::Testing {
 
@@ -24,13 +27,33 @@ std::vector<std::string> TempFolder::List() const {
     return names;
 }
 
-bool SaveImage(TestImage const& image, std::string const& path, int quality) {
+std::string ReadFile(std::string const& path) {
+    std::ifstream file(path, std::ios::binary);
+    return {std::istreambuf_iterator<char>(file), {}};
+}
+
+void WriteFile(std::string const& path, std::string const& content) {
+    std::ofstream(path, std::ios::binary) << content;
+}
+
+bool SaveImage(Picture const& image, std::string const& path, int quality) {
     Bitmap bitmap;
     String const text(path);
     // The bitmap only lends the pixels to the encoder, which reads them.
     return bitmap.Construct(const_cast<unsigned char*>(image.pixels.data()), image.width, image.height,
                             image.GetStride(), Bitmap::kFormatRgba8888, false, false) &&
            BitmapFactory::SaveBitmap(&bitmap, &text, quality);
+}
+
+Picture LoadImage(std::string const& path) {
+    String const text = String::FromFileName(path);
+    std::unique_ptr<Bitmap> const bitmap(BitmapFactory::CreateBitmapForGraphics(&text));
+    if (!bitmap) return {};
+    Picture image(bitmap->GetWidth(), bitmap->GetHeight());
+    for (int y = 0; y < image.height; ++y)
+        std::copy_n(bitmap->GetBuffer() + std::ptrdiff_t{bitmap->GetStride()} * y, image.GetStride(),
+                    image.At(0, y));
+    return image;
 }
 
 } // namespace Moka::Testing

@@ -25,7 +25,12 @@ private:
     std::filesystem::path mPath;
 };
 
+std::string ReadFile(std::string const& path);
+void WriteFile(std::string const& path, std::string const& content);
+
 // In the format of the path's extension. Whether it could.
-[[nodiscard]] bool SaveImage(TestImage const& image, std::string const& path, int quality = 100);
+[[nodiscard]] bool SaveImage(Picture const& image, std::string const& path, int quality = 100);
+// Empty when it cannot be decoded.
+Picture LoadImage(std::string const& path);
 
 } // namespace Moka::Testing

@@ -2,7 +2,6 @@
 
 #include <algorithm>
 #include <cmath>
-#include <cstring>
 
 namespace Moka::Testing {
 namespace {
@@ -10,7 +9,7 @@ namespace {
 unsigned char ToByte(int value) { return static_cast<unsigned char>(value & 0xFF); }
 
 // A round pen pressed down at (cx, cy); darker ink stays.
-void PressPen(TestImage& page, double cx, double cy, double radius, Color const& ink) {
+void PressPen(Picture& page, double cx, double cy, double radius, Color const& ink) {
     int const left = std::max(0, static_cast<int>(cx - radius - 1));
     int const right = std::min(page.width - 1, static_cast<int>(cx + radius + 1));
     int const top = std::max(0, static_cast<int>(cy - radius - 1));
@@ -29,7 +28,7 @@ void PressPen(TestImage& page, double cx, double cy, double radius, Color const&
 }
 
 // One line of joined-up writing from the left margin to the right one.
-void WriteLine(TestImage& page, double baseline, double height, int number) {
+void WriteLine(Picture& page, double baseline, double height, int number) {
     Color const ink = number % 5 == 4 ? Color{160, 20, 30, 255} : Color{20, 24, 60, 255};
     double const margin = height;
     for (double at = margin; at < page.width - margin; at += 0.5) {
@@ -44,43 +43,20 @@ void WriteLine(TestImage& page, double baseline, double height, int number) {
 
 } // namespace
 
-TestImage::TestImage(int w, int h)
-    : width(w), height(h), pixels(static_cast<std::size_t>(w) * static_cast<std::size_t>(h) * 4) {}
-
-std::size_t TestImage::GetOffset(int x, int y) const {
-    return (static_cast<std::size_t>(y) * static_cast<std::size_t>(width) + static_cast<std::size_t>(x)) * 4;
-}
-
-Color TestImage::GetColor(int x, int y) const {
-    Color color;
-    std::memcpy(color.data(), At(x, y), 4);
-    return color;
-}
-
-void TestImage::SetColor(int x, int y, Color const& color) { std::memcpy(At(x, y), color.data(), 4); }
-
-TestImage TestImage::Crop(int x, int y, int w, int h) const {
-    TestImage part(w, h);
-    for (int row = 0; row < h && w > 0; ++row) {
-        std::memcpy(part.At(0, row), At(x, y + row), static_cast<std::size_t>(w) * 4);
-    }
-    return part;
-}
-
 Color GetGradientColor(int x, int y) {
     return {ToByte(x), ToByte(y), ToByte(((x >> 8) & 0xF) << 4 | ((y >> 8) & 0xF)), 255};
 }
 
-TestImage MakeGradient(int width, int height) {
-    TestImage image(width, height);
+Picture MakeGradient(int width, int height) {
+    Picture image(width, height);
     for (int y = 0; y < height; ++y) {
         for (int x = 0; x < width; ++x) image.SetColor(x, y, GetGradientColor(x, y));
     }
     return image;
 }
 
-TestImage MakeAlphaPattern(int width, int height) {
-    TestImage image(width, height);
+Picture MakeAlphaPattern(int width, int height) {
+    Picture image(width, height);
     for (int y = 0; y < height; ++y) {
         for (int x = 0; x < width; ++x) {
             int const alpha = (x + 16 * y) & 0xFF;
@@ -91,8 +67,8 @@ TestImage MakeAlphaPattern(int width, int height) {
     return image;
 }
 
-TestImage MakeChecker(int width, int height, int cell, Color const& first, Color const& second) {
-    TestImage image(width, height);
+Picture MakeChecker(int width, int height, int cell, Color const& first, Color const& second) {
+    Picture image(width, height);
     for (int y = 0; y < height; ++y) {
         for (int x = 0; x < width; ++x) {
             image.SetColor(x, y, (x / cell + y / cell) % 2 == 0 ? first : second);
@@ -101,8 +77,8 @@ TestImage MakeChecker(int width, int height, int cell, Color const& first, Color
     return image;
 }
 
-TestImage MakeInkPage(int width, int height) {
-    TestImage page(width, height);
+Picture MakeInkPage(int width, int height) {
+    Picture page(width, height);
     double const lineHeight = std::max(16.0, width / 24.0);
     int number = 0;
     for (double baseline = lineHeight * 1.5; baseline < height; baseline += lineHeight * 1.6) {

@@ -1,9 +1,12 @@
 // Memory runs out at every place where it can, once and for good, in every scenario.
 #include "moka/base/RefPtr.h"
+#include "moka/base/String.h"
 #include "moka/graphics/bitmap/IMKBitmap.h"
+#include "moka/graphics/bitmap/ImageDecoding.h"
 #include "moka/graphics/canvas/IMKCanvas.h"
 #include "moka/graphics/factory/MKGraphicsFactory.h"
 #include "moka/renderer/RendererFactory.h"
+#include "tests/support/LogCapture.h"
 #include "tests/support/RendererTrace.h"
 #include "tests/trust/Faults.h"
 #include "tests/trust/TrustFixture.h"
@@ -65,8 +68,8 @@ TEST_P(AllocationFaults, ACallWithoutMemoryForItsCopiesLeavesNothingBehind) {
 class RequestFaults : public FaultSweep {};
 
 // A request that cannot be made is one that the queue refused: what it would have acted on, given back or
-// deleted may stay for good. So what stays is only looked at where every request was made; which leaks belong
-// to which refusal, RefusingQueueTest knows.
+// deleted may stay for good. So what stays is only looked at where every request was made; RefusingQueueTest shows
+// that nothing else stays.
 TEST_P(RequestFaults, ARequestThatCannotBeMadeIsARefusedOne) {
     auto const tasks = Faults::CountLive(Faults::Kind::Tasks);
     Sweep(Faults::Kind::Tasks, [&](bool failed) {
@@ -80,6 +83,18 @@ TEST_P(RequestFaults, ARequestThatCannotBeMadeIsARefusedOne) {
         EXPECT_EQ(RendererTrace::CountLiveObjects(), live);
         EXPECT_EQ(Faults::CountLive(Faults::Kind::Objects), objects);
     });
+}
+
+// Callers rely on this leak, which no other test shows.
+TEST(FileWithoutAQueue, LosesItsDecodedPixels) {
+    LogCapture const log;
+    MKBitmapFactory_UseNativeDecoder();
+    TempFolder const folder;
+    String const path(folder.Path("a.mki"));
+    ASSERT_TRUE(SaveImage(MakeGradient(1, 1), folder.Path("a.mki")));
+    auto const objects = Faults::CountLive(Faults::Kind::Objects);
+    EXPECT_EQ(MKGraphicsFactory::CreateBitmap(nullptr, &path, 1), nullptr);
+    EXPECT_EQ(Faults::CountLive(Faults::Kind::Objects), objects + 1);
 }
 
 // The containers of a canvas: what they have no memory for did not happen, and nobody sees an exception.

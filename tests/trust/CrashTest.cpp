@@ -1,14 +1,10 @@
 // A process that saves is killed at random moments: what lies under a real name is always a whole picture.
-#include "moka/base/Bitmap.h"
-#include "moka/base/BitmapFactory.h"
-#include "moka/base/String.h"
 #include "tests/support/TestFiles.h"
 
 #include <atomic>
 #include <chrono>
 #include <filesystem>
 #include <gtest/gtest.h>
-#include <memory>
 #include <random>
 #include <signal.h>
 #include <string>
@@ -51,7 +47,7 @@ protected:
 
     void KillSaver(std::chrono::microseconds after) {
         pid_t const child = fork();
-        ASSERT_GE(child, 0);
+        ASSERT_GE(child, 0); // kill would reach every process
         if (child == 0) SaveForEver();
         std::this_thread::sleep_for(after);
         kill(child, SIGKILL);
@@ -64,27 +60,26 @@ protected:
     int ExpectWholePictures() const {
         int found = 0;
         for (int i = 0; i < 4; ++i) {
-            String const path(Path(i));
             if (!std::filesystem::exists(Path(i))) continue;
-            std::unique_ptr<Bitmap> const bitmap(BitmapFactory::CreateBitmapForGraphics(&path));
-            EXPECT_TRUE(bitmap) << Path(i);
-            if (!bitmap) continue;
-            EXPECT_TRUE((bitmap->GetWidth() == 120 && bitmap->GetHeight() == 80) ||
-                        (bitmap->GetWidth() == 200 && bitmap->GetHeight() == 150));
+            Picture const picture = LoadImage(Path(i));
+            EXPECT_TRUE((picture.width == 120 && picture.height == 80) ||
+                        (picture.width == 200 && picture.height == 150))
+                << Path(i);
             ++found;
         }
         return found;
     }
-    int CountTemporaries() const {
+    // Takes them away; how many there were.
+    int RemoveTemporaries() const {
         int count = 0;
-        for (auto const& entry : std::filesystem::directory_iterator(folder.GetPath()))
-            if (entry.path().extension() == ".tmp") ++count;
+        for (std::string const& name : folder.List())
+            if (std::filesystem::path(name).extension() == ".tmp")
+                count += std::filesystem::remove(folder.Path(name));
         return count;
     }
 
     TempFolder const folder;
-    TestImage const images[2] = {MakeGradient(120, 80),
-                                 MakeChecker(200, 150, 7, {9, 9, 9, 9}, {0, 0, 0, 255})};
+    Picture const images[2] = {MakeGradient(120, 80), MakeChecker(200, 150, 7, {9, 9, 9, 9}, {0, 0, 0, 255})};
     Shared* shared = nullptr;
 };
 
@@ -101,9 +96,7 @@ TEST_F(CrashTest, KillingAThousandSavesLeavesOnlyWholePictures) {
         // Where saves are slower than that, one must come to its end now and then.
         longest = shared->saves == before ? 2 * longest : kShortest;
         ExpectWholePictures();
-        interrupted += CountTemporaries();
-        for (auto const& entry : std::filesystem::directory_iterator(folder.GetPath()))
-            if (entry.path().extension() == ".tmp") std::filesystem::remove(entry.path());
+        interrupted += RemoveTemporaries();
     }
     EXPECT_EQ(ExpectWholePictures(), 4);
     EXPECT_FALSE(shared->failed);

@@ -1,20 +1,14 @@
 // Every file operation of loading and saving fails in turn: the disk is full, broken or forbidden.
 #include "tests/trust/FileFaults.h"
 
-#include "moka/base/Bitmap.h"
-#include "moka/base/BitmapFactory.h"
-#include "moka/base/String.h"
 #include "moka/base/log/AndroidLog.h"
 #include "tests/support/LogCapture.h"
 #include "tests/support/TestFiles.h"
 
 #include <cerrno>
 #include <csignal>
-#include <fstream>
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
-#include <iterator>
-#include <memory>
 #include <string>
 #include <sys/resource.h>
 #include <vector>
@@ -28,19 +22,9 @@ constexpr int kErrors[] = {ENOSPC, EACCES, EIO};
 
 class FileFault : public ::testing::TestWithParam<char const*> {
 protected:
-    bool Save(TestImage const& image) const { return SaveImage(image, mPath, 90); }
-    // Its pixels; nothing when it does not load.
-    std::vector<unsigned char> Load() const {
-        String const path(mPath);
-        std::unique_ptr<Bitmap> const bitmap(BitmapFactory::CreateBitmapForGraphics(&path));
-        if (!bitmap) return {};
-        auto const size = static_cast<std::ptrdiff_t>(bitmap->GetStride()) * bitmap->GetHeight();
-        return {bitmap->GetBuffer(), bitmap->GetBuffer() + size};
-    }
-    std::string ReadFile() const {
-        std::ifstream file(mPath, std::ios::binary);
-        return {std::istreambuf_iterator<char>(file), {}};
-    }
+    bool Save(Picture const& image) const { return SaveImage(image, mPath, 90); }
+    Picture Load() const { return LoadImage(mPath); }
+    std::string ReadFile() const { return Testing::ReadFile(mPath); }
     // The picture, and no temporary file beside it.
     bool IsAlone() const { return mFolder.List().size() == 1; }
     template <class Action>
@@ -71,8 +55,8 @@ protected:
     };
 
     // Large enough for several blocks of any codec.
-    TestImage const mOld = MakeChecker(90, 70, 5, {255, 0, 0, 255}, {0, 0, 255, 255});
-    TestImage const mNew = MakeGradient(300, 200);
+    Picture const mOld = MakeChecker(90, 70, 5, {255, 0, 0, 255}, {0, 0, 255, 255});
+    Picture const mNew = MakeGradient(300, 200);
     LogCapture mLog;
 
 private:
@@ -131,19 +115,19 @@ TEST_P(FileFault, AFileThatTheKernelWillNotLetGrowLeavesTheOldOne) {
 
 TEST_P(FileFault, ALoadGivesTheWholePictureOrNothing) {
     ASSERT_TRUE(Save(mNew));
-    std::vector<unsigned char> const pixels = Load();
-    ASSERT_FALSE(pixels.empty());
+    Picture const pixels = Load();
+    ASSERT_FALSE(pixels.pixels.empty());
     int const count = Disturb(Mode::Fail, 0, 0, [&] { Load(); });
     int failures = 0;
     for (Mode const mode : {Mode::Fail, Mode::FailAll, Mode::Truncate})
         for (int k = 1; k <= count; ++k) {
             SCOPED_TRACE(std::to_string(k) + " of " + std::to_string(count));
             mLog.Clear();
-            std::vector<unsigned char> loaded;
+            Picture loaded;
             Disturb(mode, k, EIO, [&] { loaded = Load(); });
-            EXPECT_TRUE(loaded.empty() || loaded == pixels);
-            EXPECT_EQ(mLog.Count(ANDROID_LOG_ERROR), loaded.empty() ? 1 : 0);
-            if (loaded.empty()) ++failures;
+            EXPECT_TRUE(loaded.pixels.empty() || loaded == pixels);
+            EXPECT_EQ(mLog.Count(ANDROID_LOG_ERROR), loaded.pixels.empty() ? 1 : 0);
+            if (loaded.pixels.empty()) ++failures;
         }
     RecordProperty("faults", failures);
     EXPECT_GE(failures, 4);
@@ -153,13 +137,13 @@ TEST_P(FileFault, ALoadGivesTheWholePictureOrNothing) {
 TEST_P(FileFault, ShortAndInterruptedReadsAndWritesChangeNothing) {
     ASSERT_TRUE(Save(mNew));
     std::string const bytes = ReadFile();
-    std::vector<unsigned char> const pixels = Load();
+    Picture const pixels = Load();
     ASSERT_TRUE(Save(mOld));
     bool isSaved = false;
     Disturb(Mode::Short, 0, 0, [&] { isSaved = Save(mNew); });
     EXPECT_TRUE(isSaved);
     EXPECT_EQ(ReadFile(), bytes);
-    std::vector<unsigned char> loaded;
+    Picture loaded;
     Disturb(Mode::Short, 0, 0, [&] { loaded = Load(); });
     EXPECT_EQ(loaded, pixels);
 }

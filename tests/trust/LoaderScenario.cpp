@@ -9,6 +9,7 @@
 #include "tests/trust/Scenarios.h"
 
 #include <atomic>
+#include <chrono>
 #include <memory>
 #include <new>
 #include <thread>
@@ -35,7 +36,7 @@ public:
     void Await(Stage const& stage) const {
         while (mCalled < mExpected) {
             stage.settle(); // a save goes on once its pixels were read back
-            std::this_thread::yield();
+            std::this_thread::sleep_for(std::chrono::microseconds(100));
         }
     }
 

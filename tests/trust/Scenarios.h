@@ -18,11 +18,12 @@ struct Stage {
 };
 
 struct Scenario {
-    char const* name;
-    void (*run)(Stage const& stage);
+    std::string name;
+    std::function<void(Stage const&)> run;
 };
 
-std::vector<Scenario> const& GetScenarios();
+// One for each file of tests/trust/scenes, which is drawn and read back, and what no scene says.
+std::vector<Scenario> GetScenarios();
 
 // Loads and saves with the loader. Not among the others, since it waits for every callback, and a save whose
 // read-back is refused calls nobody, as callers know.

@@ -3,10 +3,12 @@
 #include "moka/base/String.h"
 #include "moka/graphics/bitmap/ImageDecoding.h"
 #include "moka/graphics/factory/MKGraphicsFactory.h"
+#include "moka/graphics/loader/BitmapLoader.h"
 #include "moka/graphics/loader/MKBitmapLoader.h"
 #include "moka/graphics/loader/MKBitmapSaveManager.h"
 #include "moka/host/TaskQueue.h"
 #include "moka/renderer/RendererFactory.h"
+#include "tests/support/Awaited.h"
 #include "tests/support/LogCapture.h"
 #include "tests/support/RendererTrace.h"
 #include "tests/support/TestFiles.h"
@@ -15,6 +17,7 @@
 
 #include <atomic>
 #include <gtest/gtest.h>
+#include <random>
 #include <string>
 #include <thread>
 #include <vector>
@@ -40,7 +43,7 @@ protected:
             &queue, MixedWork::kSide, MixedWork::kHeight, nullptr, false, 1, false));
         auto const canvas =
             RefPtr<IMKCanvas>::Adopt(MKGraphicsFactory::CreateCanvas(&queue, target.Get(), 1));
-        std::atomic<int> own{0};
+        Awaited<int> own;
         MKBitmapLoader::Callback callback;
         callback.onLoad = [&](int, String const&, IMKBitmap& loaded) {
             canvas->DrawBitmap(&loaded, 0, 0, nullptr);
@@ -52,9 +55,9 @@ protected:
             EXPECT_TRUE(loader.RequestLoad(id, path, &queue));
             EXPECT_TRUE(loader.RequestSave(id, savePath, *target, nullptr, 100));
         }
-        while (own < 2 * kLoads) std::this_thread::yield();
+        own.AwaitAtLeast(2 * kLoads);
         loader.WaitForCallback();
-        called += own;
+        called += own.Get();
     }
 
     // Saves what all draw, and hears of it through the thread's message loop.
@@ -71,11 +74,36 @@ protected:
             EXPECT_TRUE(manager.RequestSave(id, String(folder.Path(name)), bitmap, &callback, 100));
             loop.RunPending();
         }
-        while (manager.GetRequestSaveCount() > kLoads / 2) {
-            loop.RunPending();
-            std::this_thread::yield();
-        }
+        loop.RunPending();
         manager.WaitForSaveCompleting(&queue);
+    }
+
+    // One front end after the other, destroyed with requests in hand: each request calls once at most, and
+    // none calls afterwards.
+    template <class Loader>
+    void CancelAndDestroy(IGLMsgQueue& queue, unsigned seed) {
+        std::mt19937 random(seed);
+        for (int round = 0; round < 15; ++round) {
+            std::atomic<bool> isAlive{true};
+            std::vector<std::atomic<int>> calls(20);
+            typename Loader::Callback callback;
+            callback.onLoad = [&](int id, String const&, auto&) {
+                EXPECT_TRUE(isAlive);
+                EXPECT_EQ(++calls[static_cast<std::size_t>(id)], 1);
+            };
+            {
+                Loader loader("pad", &callback);
+                for (int id = 0; id < 20; ++id) {
+                    EXPECT_TRUE(loader.RequestLoad(id, path, &queue));
+                    if (random() % 4 == 0) loader.CancelLoadRequest(id / 2);
+                    if (random() % 16 == 0) loader.CancelAllLoadRequest();
+                    if (random() % 16 == 0) loader.WaitForCallback();
+                    if (random() % 4 == 0) Loader::WaitForAllSaveRequestsToEnd(&queue);
+                }
+                if (round % 2 == 0) MKBitmapLoader::WaitUntilMsgQueueRequired();
+            }
+            isAlive = false;
+        }
     }
 
     TempFolder const folder;
@@ -97,6 +125,8 @@ TEST_F(ThreadsTest, RandomCallersTheLoaderAndHandlersShareOneRenderThread) {
                 for (int i = 0; i < kSteps; ++i) work.Step();
             });
         threads.emplace_back([&] { LoadDrawAndSave(queue); });
+        threads.emplace_back([&] { CancelAndDestroy<MKBitmapLoader>(queue, 1); });
+        threads.emplace_back([&] { CancelAndDestroy<BitmapLoader>(queue, 2); });
         for (char const* const name : {"c.mki", "d.png"})
             threads.emplace_back([&, name] { SaveManaged(queue, *shared, name); });
         for (std::thread& thread : threads) thread.join();

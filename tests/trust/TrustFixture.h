@@ -34,8 +34,7 @@ protected:
 
     // To its end, or until a call of the library throws for want of memory, and until nothing is posted any more.
     void RunScenario();
-    // The same, undisturbed; what it drew and cleared, with objects named in the order of their appearance,
-    // so that two runs compare.
+    // The same, undisturbed; what it asked of the renderer, without the numbers of the objects.
     std::vector<std::string> TakeFrame();
     // The shader manager forgets what it has.
     static void ForgetShaders();

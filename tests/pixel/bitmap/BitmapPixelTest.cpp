@@ -47,18 +47,18 @@ protected:
         for (std::string const& line : log.GetTexts(ANDROID_LOG_ERROR)) ADD_FAILURE() << line;
     }
 
-    BitmapPtr Create(TestImage const& image) {
+    BitmapPtr Create(Picture const& image) {
         return NewBitmap(*queue, image.width, image.height, image.pixels.data());
     }
 
-    static TestImage Read(BitmapPtr const& bitmap, Rect const& r) {
-        TestImage image(r.GetWidth(), r.GetHeight());
+    static Picture Read(BitmapPtr const& bitmap, Rect const& r) {
+        Picture image(r.GetWidth(), r.GetHeight());
         bitmap->GetBitmapData(r, image.pixels.data());
         return image;
     }
-    static TestImage Read(BitmapPtr const& bitmap) { return Read(bitmap, bitmap->GetBitmapRect()); }
+    static Picture Read(BitmapPtr const& bitmap) { return Read(bitmap, bitmap->GetBitmapRect()); }
 
-    static void ExpectSame(TestImage const& a, TestImage const& b) {
+    static void ExpectSame(Picture const& a, Picture const& b) {
         ImageDifference const difference = CompareImages(a, b);
         EXPECT_EQ(difference.differingPixels, 0) << difference;
     }
@@ -70,7 +70,7 @@ protected:
 TEST_F(PixelBitmap, RoundTripsEveryStripCountBitForBit) {
     for (int height : {1, kMaxSide - 1, kMaxSide, kMaxSide + 1, 3 * kMaxSide, 5 * kMaxSide + 17})
         for (int width : {1, 3, kMaxSide})
-            for (TestImage const& image : {MakeGradient(width, height), MakeAlphaPattern(width, height)}) {
+            for (Picture const& image : {MakeGradient(width, height), MakeAlphaPattern(width, height)}) {
                 auto const bitmap = Create(image);
                 EXPECT_EQ(bitmap->GetTextureBitmap()->GetSubBitmapCount(),
                           (height + kMaxSide - 1) / kMaxSide);
@@ -79,13 +79,13 @@ TEST_F(PixelBitmap, RoundTripsEveryStripCountBitForBit) {
 }
 
 TEST_F(PixelBitmap, ReadsBlocksOverStripEdgesAndPartlyOutside) {
-    TestImage const image = MakeGradient(40, 2 * kMaxSide + 20);
+    Picture const image = MakeGradient(40, 2 * kMaxSide + 20);
     auto const bitmap = Create(image);
     ExpectSame(Read(bitmap, Rect(3, kMaxSide - 5, 31, 2 * kMaxSide + 7)),
                image.Crop(3, kMaxSide - 5, 28, kMaxSide + 12));
     Rect const over(-2, 2 * kMaxSide, 44, 2 * kMaxSide + 30);
-    TestImage block = MakeChecker(over.GetWidth(), over.GetHeight(), 1, {9, 9, 9, 9}, {7, 7, 7, 7});
-    TestImage expected = block;
+    Picture block = MakeChecker(over.GetWidth(), over.GetHeight(), 1, {9, 9, 9, 9}, {7, 7, 7, 7});
+    Picture expected = block;
     bitmap->GetBitmapData(over, block.pixels.data());
     for (int y = 0; y < 20; ++y)
         for (int x = 0; x < 40; ++x) expected.SetColor(x + 2, y, image.GetColor(x, 2 * kMaxSide + y));
@@ -100,9 +100,9 @@ TEST_F(PixelBitmap, ReadsBlocksOverStripEdgesAndPartlyOutside) {
 
 TEST_F(PixelBitmap, WithoutPixelsItIsTransparentAndUpdatesLandWhereTheyShould) {
     auto const bitmap = NewBitmap(*queue, 32, kMaxSide + 8);
-    TestImage expected(32, kMaxSide + 8);
+    Picture expected(32, kMaxSide + 8);
     ExpectSame(Read(bitmap), expected);
-    TestImage const patch = MakeGradient(10, 6);
+    Picture const patch = MakeGradient(10, 6);
     Rect const r(4, 20, 14, 26);
     bitmap->GetTextureBitmap()->UpdateBitmap(r, patch.pixels.data(), patch.GetStride());
     for (int y = 0; y < 6; ++y)
@@ -111,8 +111,8 @@ TEST_F(PixelBitmap, WithoutPixelsItIsTransparentAndUpdatesLandWhereTheyShould) {
 }
 
 TEST_F(PixelBitmap, AShareSeesUpdatesWhoeverGoesFirstAndAStripsCloneDoesNot) {
-    TestImage const image = MakeGradient(33, kMaxSide + 3);
-    TestImage const other = MakeChecker(33, kMaxSide + 3, 2, {255, 0, 0, 255}, {0, 0, 255, 255});
+    Picture const image = MakeGradient(33, kMaxSide + 3);
+    Picture const other = MakeChecker(33, kMaxSide + 3, 2, {255, 0, 0, 255}, {0, 0, 255, 255});
     for (bool parentFirst : {true, false}) {
         auto parent = Create(image);
         auto clone = BitmapPtr::Adopt(parent->Clone());
@@ -124,7 +124,7 @@ TEST_F(PixelBitmap, AShareSeesUpdatesWhoeverGoesFirstAndAStripsCloneDoesNot) {
         auto const fresh = Create(image); // a GL name deleted twice would now be this one's
         ExpectSame(Read(parentFirst ? clone : parent), other);
         ExpectSame(Read(fresh), image);
-        TestImage read(33, kMaxSide);
+        Picture read(33, kMaxSide);
         copy->GetBitmapData(Rect(0, 0, 33, kMaxSide), read.pixels.data());
         ExpectSame(read, image.Crop(0, 0, 33, kMaxSide));
     }
@@ -142,15 +142,15 @@ TEST_F(PixelBitmap, ClearsReachEveryStripThroughTheRenderSide) {
         bitmap->GetBitmapWritable()->DeactivateFrameBufferRT(false, DiscardFramebufferDepthStencil);
     }));
     bitmap->GetBitmapCanvasAttachable()->DetachFromCanvas();
-    TestImage const read = Read(bitmap);
+    Picture const read = Read(bitmap);
     EXPECT_EQ(read.GetColor(0, 0), (Color{51, 102, 153, 204}));
     EXPECT_EQ(read.GetColor(7, 2 * kMaxSide - 1), (Color{51, 102, 153, 204}));
 }
 
 TEST_F(PixelBitmap, TheRenderThreadFlavourGivesTheSame) {
-    TestImage const image = MakeGradient(20, 2 * kMaxSide + 1);
-    TestImage direct(image.width, image.height);
-    TestImage shared(image.width, image.height);
+    Picture const image = MakeGradient(20, 2 * kMaxSide + 1);
+    Picture direct(image.width, image.height);
+    Picture shared(image.width, image.height);
     ASSERT_TRUE(queue->Call([&] {
         auto const bitmap =
             NewBitmap(*queue, image.width, image.height, image.pixels.data(), UseFrom::RenderThread);
@@ -164,7 +164,7 @@ TEST_F(PixelBitmap, TheRenderThreadFlavourGivesTheSame) {
 
 TEST_F(PixelBitmap, ASavedBitmapIsLoadedWithEveryPixelAndAMissingFileSaysWhy) {
     TempFolder const folder;
-    TestImage const image = MakeAlphaPattern(20, 2 * kMaxSide + 1);
+    Picture const image = MakeAlphaPattern(20, 2 * kMaxSide + 1);
     std::string reason;
     ASSERT_TRUE(SaveBitmap(*Create(image), folder.Path("picture.mki"), 100, &reason)) << reason;
     ExpectSame(Read(LoadBitmap(*queue, folder.Path("picture.mki"))), image);
@@ -177,7 +177,7 @@ TEST_F(PixelBitmap, ASavedBitmapIsLoadedWithEveryPixelAndAMissingFileSaysWhy) {
 }
 
 TEST_F(PixelBitmap, RowsThatAreNotTightlyPackedArriveWithoutTheirGaps) {
-    TestImage image = MakeGradient(20, 10);
+    Picture image = MakeGradient(20, 10);
     auto wide = std::make_unique<Bitmap>(); // its left part, which it does not own
     ASSERT_TRUE(wide->Construct(image.pixels.data(), 16, 10, image.GetStride(), Bitmap::kFormatRgba8888,
                                 false, false));
@@ -186,7 +186,7 @@ TEST_F(PixelBitmap, RowsThatAreNotTightlyPackedArriveWithoutTheirGaps) {
 
 TEST_F(PixelBitmap, AWidthOverTheLimitIsReportedAndInert) {
     auto const bitmap = Create(MakeGradient(kMaxSide + 1, 4));
-    TestImage block(4, 4);
+    Picture block(4, 4);
     std::memset(block.pixels.data(), 1, block.pixels.size());
     bitmap->GetBitmapData(Rect(0, 0, 4, 4), block.pixels.data());
     EXPECT_EQ(block.GetColor(0, 0), (Color{1, 1, 1, 1}));

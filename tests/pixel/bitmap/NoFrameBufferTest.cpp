@@ -57,7 +57,7 @@ protected:
             window = RendererFactory::CreateRenderTargetFromDefault(kSide, kSide);
             window->ClearColor(0.2f, 0.4f, 0.6f, 1);
         });
-        TestImage const white = MakeChecker(8, 8, 1, {255, 255, 255, 255}, {255, 255, 255, 255});
+        Picture const white = MakeChecker(8, 8, 1, {255, 255, 255, 255}, {255, 255, 255, 255});
         source = Create(8, 8, white.pixels.data());
         custom =
             RefPtr<MKNonPremultipliedColorDrawable>::Adopt(new MKNonPremultipliedColorDrawable(queue.get()));
@@ -79,14 +79,14 @@ protected:
         return NewBitmap(*queue, width, height, pixels);
     }
 
-    TestImage ReadWindow() {
-        TestImage image(kSide, kSide);
+    Picture ReadWindow() {
+        Picture image(kSide, kSide);
         thread->Call([&] { window->ReadPixels(0, 0, kSide, kSide, {image.pixels.data(), kSide, 0, 0}); });
         return image;
     }
 
     void ExpectWindowUntouched(char const* what) {
-        TestImage const expected = MakeChecker(kSide, kSide, 1, kWindow, kWindow);
+        Picture const expected = MakeChecker(kSide, kSide, 1, kWindow, kWindow);
         EXPECT_EQ(CompareImages(expected, ReadWindow()).differingPixels, 0) << what;
     }
 

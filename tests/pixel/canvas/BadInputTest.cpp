@@ -58,7 +58,7 @@ protected:
             canvas.ClearAll(0x60203040);
             DrawSomething(canvas);
         };
-        TestImage const start = MakeBackdrop(48, 48);
+        Picture const start = MakeBackdrop(48, 48);
         Drawing const undisturbed{start, [&](IMKCanvas& canvas, Scenes::SceneStage&) { good(canvas); }};
         Drawing const disturbed{start, [&](IMKCanvas& canvas, Scenes::SceneStage& stage) {
                                     canvas.Save(IMKCanvasBase::SaveAll);
@@ -66,7 +66,7 @@ protected:
                                     canvas.Restore(0);
                                     good(canvas);
                                 }};
-        TestImage const expected = Draw(undisturbed);
+        Picture const expected = Draw(undisturbed);
         for (Way const way : {Way::Deferred, Way::RenderThread})
             ExpectSame(expected, Draw(disturbed, way), what);
     }
@@ -174,7 +174,7 @@ TEST_F(BadInputTest, ABitmapIsDrawnOntoItselfAndOntoItsClone) {
 }
 
 TEST_F(BadInputTest, APostedDrawHasItsOwnCopyOfEverything) {
-    TestImage const start(40, 40);
+    Picture const start(40, 40);
     std::vector<RectF> const places{RectF(2, 22, 12, 32)};
     auto const draw = [&](IMKCanvas& canvas, Scenes::SceneStage& stage, bool disturb) {
         auto bitmap = MakeBitmap(stage, MakeBackdrop(20, 20));
@@ -228,7 +228,7 @@ private:
 };
 
 TEST_F(BadInputTest, ARefusedDrawLeavesTheOthersRight) {
-    TestImage const start = MakeBackdrop(40, 40);
+    Picture const start = MakeBackdrop(40, 40);
     auto const drawRect = [](IMKCanvas& canvas, int i) {
         MKPaint const paint = MakePaint();
         auto const x = static_cast<float>(10 * i);
@@ -242,7 +242,7 @@ TEST_F(BadInputTest, ARefusedDrawLeavesTheOthersRight) {
         for (int i = 0; i < 3; ++i) drawRect(*canvas, i);
         canvas = {};
         EXPECT_EQ(queue.GetOffered(), 5); // the last one deletes
-        TestImage actual(40, 40);
+        Picture actual(40, 40);
         target->GetBitmapData(target->GetBitmapRect(), actual.pixels.data());
         ExpectSame(Draw({start,
                          [&](IMKCanvas& c, Scenes::SceneStage&) {

@@ -9,8 +9,8 @@ namespace {
 constexpr int kSide = 16;
 
 // Alpha grows to the right in the one, downwards in the other: each pixel is a pair of its own.
-TestImage MakeSource() {
-    TestImage image(kSide, kSide);
+Picture MakeSource() {
+    Picture image(kSide, kSide);
     for (int y = 0; y < kSide; ++y) {
         for (int x = 0; x < kSide; ++x) {
             int const alpha = x * 17;
@@ -22,9 +22,9 @@ TestImage MakeSource() {
     return image;
 }
 
-TestImage MakeDestination() {
-    TestImage const source = MakeSource();
-    TestImage image(kSide, kSide);
+Picture MakeDestination() {
+    Picture const source = MakeSource();
+    Picture image(kSide, kSide);
     for (int y = 0; y < kSide; ++y) {
         for (int x = 0; x < kSide; ++x) {
             Color const c = source.GetColor(y, x);
@@ -43,7 +43,7 @@ MKPaint MakePaint(int mode) {
 class EveryMode : public CanvasDrawing, public ::testing::WithParamInterface<int> {};
 
 TEST_P(EveryMode, BlendsRectanglesByItsEquation) {
-    TestImage const source = MakeSource();
+    Picture const source = MakeSource();
     MKPaint paint = MakePaint(GetParam());
     ExpectLikeReference(
         {MakeDestination(),

@@ -63,11 +63,11 @@ private:
     int const mUseQueue;
 };
 
-TestImage DrawOnGpu(Drawing const& drawing, IGLMsgQueue& queue, bool onRenderThread) {
-    TestImage const& start = drawing.start;
+Picture DrawOnGpu(Drawing const& drawing, IGLMsgQueue& queue, bool onRenderThread) {
+    Picture const& start = drawing.start;
     UseFrom const from = onRenderThread ? UseFrom::RenderThread : UseFrom::AnyThread;
     auto const bitmap = NewBitmap(queue, start.width, start.height, start.pixels.data(), from);
-    TestImage picture(start.width, start.height);
+    Picture picture(start.width, start.height);
     if (!bitmap) return picture;
     {
         auto const canvas = NewCanvas(queue, bitmap, from);
@@ -80,19 +80,17 @@ TestImage DrawOnGpu(Drawing const& drawing, IGLMsgQueue& queue, bool onRenderThr
 
 } // namespace
 
-TestImage MakeBackdrop(int width, int height) {
-    TestImage const pattern = MakeAlphaPattern(16, 16);
-    TestImage image(width, height);
+Picture MakeBackdrop(int width, int height) {
+    Picture const pattern = MakeAlphaPattern(16, 16);
+    Picture image(width, height);
     for (int y = 0; y < height; ++y) {
         for (int x = 0; x < width; ++x) image.SetColor(x, y, pattern.GetColor(y % 16, x % 16));
     }
     return image;
 }
 
-RefPtr<IMKBitmap> MakeBitmap(Scenes::SceneStage& stage, TestImage const& image) {
-    Scenes::Picture picture(image.width, image.height);
-    picture.pixels = image.pixels;
-    return RefPtr<IMKBitmap>::Adopt(stage.MakeBitmap(picture));
+RefPtr<IMKBitmap> MakeBitmap(Scenes::SceneStage& stage, Picture const& image) {
+    return RefPtr<IMKBitmap>::Adopt(stage.MakeBitmap(image));
 }
 
 Drawing Twice(Drawing drawing) {
@@ -121,9 +119,9 @@ void CanvasDrawing::TearDown() {
     if (kept > 0) GetRenderer().Stop();
 }
 
-TestImage CanvasDrawing::Draw(Drawing const& drawing, Way way) {
+Picture CanvasDrawing::Draw(Drawing const& drawing, Way way) {
     RenderThread& thread = GetRenderThread();
-    TestImage picture(0, 0);
+    Picture picture(0, 0);
     if (way == Way::Immediate) thread.Call([] { RendererFactory::SetDeferred(false); });
     if (way == Way::RenderThread) {
         thread.Call([&] { picture = DrawOnGpu(drawing, thread, true); });
@@ -150,7 +148,7 @@ void CanvasDrawing::ExpectLikeReference(Drawing const& drawing, std::string cons
     ExpectLike(DrawReference(drawing, mSide), Draw(drawing, way), what);
 }
 
-void CanvasDrawing::ExpectLike(ReferencePicture const& reference, TestImage const& actual,
+void CanvasDrawing::ExpectLike(ReferencePicture const& reference, Picture const& actual,
                                std::string const& what) {
     int const open = reference.slack.CountOver(kCoarse);
     EXPECT_LE(open * 7, actual.width * actual.height) << what << ": the reference knows too little";
@@ -158,7 +156,7 @@ void CanvasDrawing::ExpectLike(ReferencePicture const& reference, TestImage cons
     ExpectSame(reference.image, actual, what, &reference.slack);
 }
 
-void CanvasDrawing::ExpectSame(TestImage const& expected, TestImage const& actual, std::string const& what,
+void CanvasDrawing::ExpectSame(Picture const& expected, Picture const& actual, std::string const& what,
                                Slack const* slack) {
     ImageDifference const difference = CompareImages(expected, actual, slack);
     if (difference.differingPixels == 0) return;

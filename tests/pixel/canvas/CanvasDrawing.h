@@ -20,7 +20,7 @@ namespace Moka::Testing {
 struct Drawing {
     using Function = std::function<void(IMKCanvas&, Scenes::SceneStage&)>;
 
-    TestImage start;
+    Picture start;
     Function draw;
 };
 
@@ -32,15 +32,15 @@ enum class Way {
 
 // What the reference drew, and how far off each pixel may be.
 struct ReferencePicture {
-    TestImage image;
+    Picture image;
     Slack slack;
 };
 
 // Every alpha, with colours of its own, so that every blend shows.
-TestImage MakeBackdrop(int width, int height);
+Picture MakeBackdrop(int width, int height);
 
 // On the drawing's own stage.
-RefPtr<IMKBitmap> MakeBitmap(Scenes::SceneStage& stage, TestImage const& image);
+RefPtr<IMKBitmap> MakeBitmap(Scenes::SceneStage& stage, Picture const& image);
 
 // Draws everything, clears it, and draws it again: the renderer merges short runs of draws when it sees them for
 // the second time.
@@ -58,14 +58,14 @@ protected:
     // Nothing alive on the GPU, no driver message, no error line.
     void TearDown() override;
 
-    TestImage Draw(Drawing const& drawing, Way way = Way::Deferred);
+    Picture Draw(Drawing const& drawing, Way way = Way::Deferred);
 
     ReferencePicture DrawReference(Drawing const& drawing, int maxSide) const;
 
     // As near as the reference allows, which may leave more than kCoarse open in a seventh of the picture.
     void ExpectLikeReference(Drawing const& drawing, std::string const& what, Way way = Way::Deferred);
-    void ExpectLike(ReferencePicture const& reference, TestImage const& actual, std::string const& what);
-    static void ExpectSame(TestImage const& expected, TestImage const& actual, std::string const& what,
+    void ExpectLike(ReferencePicture const& reference, Picture const& actual, std::string const& what);
+    static void ExpectSame(Picture const& expected, Picture const& actual, std::string const& what,
                            Slack const* slack = nullptr);
 
     LogCapture log;

@@ -173,7 +173,7 @@ TEST_F(ClipTest, WhatComesAfterAClippedDrawIsNotClipped) {
                               }};
         ExpectLikeReference(drawing, stencil ? "after a stencil clip" : "after a straight clip");
         // Also on another target.
-        Drawing const plain{TestImage(8, 8), [](IMKCanvas& canvas, Scenes::SceneStage&) {
+        Drawing const plain{Picture(8, 8), [](IMKCanvas& canvas, Scenes::SceneStage&) {
                                 canvas.DrawRect(0, 0, 8, 8, nullptr);
                             }};
         EXPECT_EQ(Draw(plain).GetColor(7, 7), (Color{255, 255, 255, 255}));

@@ -24,7 +24,7 @@ class CoverageTest : public CanvasDrawing {
 protected:
     // In every style, by a function of the canvas and the paint.
     template <class Function>
-    void ExpectInEveryStyle(TestImage const& start, std::string const& what, Function const& draw) {
+    void ExpectInEveryStyle(Picture const& start, std::string const& what, Function const& draw) {
         for (int const style : {0, 1, 2}) {
             for (float const width : {1.0f, 2.5f, 4.0f}) {
                 for (bool const antiAliased : {false, true}) {
@@ -42,9 +42,9 @@ protected:
 TEST_F(CoverageTest, ACornerTakesTheLesserOfItsTwoRamps) {
     MKPaint paint;
     paint.SetAntiAliasing(true);
-    TestImage const picture = Draw({TestImage(20, 20), [&](IMKCanvas& canvas, Scenes::SceneStage&) {
-                                        canvas.DrawRect(3.25f, 4.5f, 12, 12.75f, &paint);
-                                    }});
+    Picture const picture = Draw({Picture(20, 20), [&](IMKCanvas& canvas, Scenes::SceneStage&) {
+                                      canvas.DrawRect(3.25f, 4.5f, 12, 12.75f, &paint);
+                                  }});
     auto const alpha = [&](int x, int y) { return int{picture.GetColor(x, y)[3]}; };
     EXPECT_NEAR(alpha(3, 8), 0.75 * 255, 1);
     EXPECT_NEAR(alpha(8, 4), 0.5 * 255, 1);
@@ -168,7 +168,7 @@ TEST_F(CoverageTest, SimpleLinesAreSoftAlongTheirSidesOnly) {
 
 TEST_F(CoverageTest, WidthsUnderOneDrawNothingButCircles) {
     MKPaint const paint = MakePaint(MKPaint::Stroke, 0.9f, true);
-    TestImage const start = MakeBackdrop(40, 40);
+    Picture const start = MakeBackdrop(40, 40);
     ExpectSame(start,
                Draw({start,
                      [&](IMKCanvas& canvas, Scenes::SceneStage&) {

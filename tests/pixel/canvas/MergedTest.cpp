@@ -107,9 +107,9 @@ TEST_P(MergedTest, RandomDrawsAreTheSameAsOneByOne) {
                    canvas.GetBitmap()->GetBitmapData(Rect(0, 0, 1, 1), texel); // flushes
                    variants = RendererFactory::GetStatistics().variants;
                }});
-    TestImage const single = Draw(drawing, Way::Immediate);
+    Picture const single = Draw(drawing, Way::Immediate);
     RendererStatistics const before = RendererFactory::GetStatistics();
-    TestImage const merged = Draw(drawing);
+    Picture const merged = Draw(drawing);
     RendererStatistics const after = RendererFactory::GetStatistics();
     EXPECT_GT(variants, 0);
     EXPECT_LT(after.draws - before.draws, after.drawRequests - before.drawRequests);

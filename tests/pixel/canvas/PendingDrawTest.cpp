@@ -46,8 +46,8 @@ protected:
     }
 
     // How often read finds anything but the new colour all over.
-    int CountWrong(std::function<TestImage(Drawn const&)> const& read) {
-        TestImage const expected = MakeChecker(kSide, kSide, 1, kNew, kNew);
+    int CountWrong(std::function<Picture(Drawn const&)> const& read) {
+        Picture const expected = MakeChecker(kSide, kSide, 1, kNew, kNew);
         Drawn const drawn = Make();
         Drawn const other = Make();
         int wrong = 0;
@@ -61,8 +61,8 @@ protected:
         return wrong;
     }
 
-    static TestImage Read(IMKBitmapDataGettable& source) {
-        TestImage image(kSide, kSide);
+    static Picture Read(IMKBitmapDataGettable& source) {
+        Picture image(kSide, kSide);
         source.GetBitmapData(Rect(0, 0, kSide, kSide), image.pixels.data());
         return image;
     }

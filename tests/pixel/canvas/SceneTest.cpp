@@ -11,7 +11,7 @@ namespace {
 using Scenes::Scene;
 
 Drawing ToDrawing(Scene const& scene) {
-    return {TestImage(scene.width, scene.height), [&scene](IMKCanvas& canvas, Scenes::SceneStage& stage) {
+    return {Picture(scene.width, scene.height), [&scene](IMKCanvas& canvas, Scenes::SceneStage& stage) {
                 Scenes::DrawScene(scene, canvas, stage);
             }};
 }
@@ -47,7 +47,7 @@ INSTANTIATE_TEST_SUITE_P(All, SceneOnCpu,
 
 TEST_P(SceneTest, IsTheSameOnEveryWay) {
     Drawing const drawing = Twice(ToDrawing(GetScene()));
-    TestImage const deferred = Draw(drawing);
+    Picture const deferred = Draw(drawing);
     // Merged draws run another program.
     Slack const slack(deferred.width, deferred.height, 1);
     ExpectSame(deferred, Draw(drawing, Way::Immediate), GetParam() + " immediate", &slack);
@@ -68,7 +68,7 @@ TEST_P(SceneInStrips, LooksAsTheReferenceDrawsIt) {
     int const side = std::max(scene.width, scene.height);
     int const top = side - scene.height / 2;
     UseLargestSide(side);
-    ExpectLikeReference({TestImage(scene.width, top + scene.height),
+    ExpectLikeReference({Picture(scene.width, top + scene.height),
                          [&](IMKCanvas& canvas, Scenes::SceneStage& stage) {
                              canvas.PreTranslate(0, static_cast<float>(top));
                              Scenes::DrawScene(scene, canvas, stage);
@@ -84,9 +84,9 @@ class SceneInThreeStrips : public SceneTest {};
 
 TEST_P(SceneInThreeStrips, IsTheSameAsOnOne) {
     Drawing const drawing = ToDrawing(GetScene());
-    TestImage const whole = Draw(drawing);
+    Picture const whole = Draw(drawing);
     UseLargestSide(Scenes::GetSideForThreeStrips(GetScene()));
-    TestImage const strips = Draw(drawing);
+    Picture const strips = Draw(drawing);
     ReferencePicture const reference = DrawReference(drawing, Scenes::GetSideForThreeStrips(GetScene()));
     ExpectLike(reference, strips, GetParam() + " in three strips");
     // A source cut into strips does not blend over its cuts.

@@ -13,7 +13,7 @@ namespace {
 
 constexpr int kWidth = 8;
 constexpr int kHeight = 4;
-constexpr Pixel kBackground{10, 20, 30, 40};
+constexpr Color kBackground{10, 20, 30, 40};
 Vector4<float> const kColor(0.9f, 0.5f, 0.2f, 0.8f);
 Vector4<float> const kTint(0.1f, 0.7f, 1.0f, 0.6f);
 
@@ -30,9 +30,9 @@ Rgba Tinted(double alpha) {
 }
 
 // What a texture shows where each of its pixels lies on one of the target.
-Rgba At(Image const& image, double x, double y) {
-    Pixel const p = image.At(static_cast<int>(x), static_cast<int>(y));
-    return Rgba{double(p.r), double(p.g), double(p.b), double(p.a)} * (1 / 255.0);
+Rgba At(Picture const& image, double x, double y) {
+    Color const p = image.GetColor(static_cast<int>(x), static_cast<int>(y));
+    return Rgba{double(p[0]), double(p[1]), double(p[2]), double(p[3])} * (1 / 255.0);
 }
 
 // What is drawn at a point, in pixels; nothing where the fragment is discarded.
@@ -55,17 +55,17 @@ private:
 };
 
 // Premultiplied, every alpha from 0 to 255, colours that differ in all channels.
-Image MakeSource(int seed) {
-    Image image(kWidth, kHeight);
+Picture MakeSource(int seed) {
+    Picture image = MakeImage(kWidth, kHeight);
     for (int i = 0; i < kWidth * kHeight; ++i) {
         int const alpha = (i * 8 + seed * 40) % 256;
         auto const channel = [&](int step) {
             return static_cast<std::uint8_t>(alpha * ((i * step + seed) % 11) / 10);
         };
-        image.pixels[static_cast<std::size_t>(i)] = {channel(3), channel(5), channel(7),
-                                                     static_cast<std::uint8_t>(alpha)};
+        image.SetColor(i % kWidth, i / kWidth,
+                       {channel(3), channel(5), channel(7), static_cast<std::uint8_t>(alpha)});
     }
-    image.At(2, 1) = {};
+    image.SetColor(2, 1, {});
     return image;
 }
 
@@ -85,8 +85,8 @@ protected:
     }
 
     // On units 0, 1, ...
-    void Bind(std::initializer_list<Image> images) {
-        for (Image const& image : images) {
+    void Bind(std::initializer_list<Picture> images) {
+        for (Picture const& image : images) {
             mSources.push_back(MakeTexture(image));
             mSources.back()->Bind(static_cast<int>(mSources.size()) - 1);
         }
@@ -99,7 +99,7 @@ protected:
 
     // Over the whole target, which has an attribute of what values(x, y) gives at its corners.
     template <class... Functions>
-    Image Draw(Functions... values) {
+    Picture Draw(Functions... values) {
         auto const atCorners = [](auto const& value) {
             RawAttribute attribute{};
             for (int corner = 0; corner < 4; ++corner) {
@@ -116,7 +116,7 @@ protected:
         return Read(*mTarget, kWidth, kHeight);
     }
     static double Coverage(double x) { return 0.25 + x / 16; }
-    Image DrawCovered() {
+    Picture DrawCovered() {
         return Draw(
             [](float x, float y) {
                 return std::vector<float>{x, y, 0.25f + x / 16};
@@ -125,19 +125,20 @@ protected:
                 return std::vector<float>{x / kWidth, y / kHeight};
             });
     }
-    Image DrawWhole() {
+    Picture DrawWhole() {
         return Draw([](float x, float y) { return std::vector<float>{x, y, x / kWidth, y / kHeight}; });
     }
 
-    static void Expect(Image const& drawn, Reference const& reference) {
+    static void Expect(Picture const& drawn, Reference const& reference) {
         for (int y = 0; y < kHeight; ++y) {
             for (int x = 0; x < kWidth; ++x) {
                 std::optional<Rgba> const wanted = reference(x + 0.5, y + 0.5);
-                Rgba const c = wanted ? *wanted * 255 : At(Image(kWidth, kHeight, kBackground), x, y) * 255;
-                Pixel const p = drawn.At(x, y);
+                Rgba const c =
+                    wanted ? *wanted * 255 : At(MakeImage(kWidth, kHeight, kBackground), x, y) * 255;
+                Color const p = drawn.GetColor(x, y);
                 double const off = std::max(
-                    {std::abs(p.r - c.r), std::abs(p.g - c.g), std::abs(p.b - c.b), std::abs(p.a - c.a)});
-                ASSERT_LE(off, wanted ? 1 : 0) << x << ", " << y << " is " << p;
+                    {std::abs(p[0] - c.r), std::abs(p[1] - c.g), std::abs(p[2] - c.b), std::abs(p[3] - c.a)});
+                ASSERT_LE(off, wanted ? 1 : 0) << x << ", " << y << " is " << ::testing::PrintToString(p);
             }
         }
     }
@@ -149,9 +150,9 @@ private:
 };
 
 TEST_F(ShaderTest, TheClampKeepsColoursBelowAlphaAndTouchesNothingElse) {
-    Image source = MakeSource(2);
-    source.At(3, 0) = {255, 100, 7, 50};
-    source.At(4, 3) = {255, 255, 255, 0};
+    Picture source = MakeSource(2);
+    source.SetColor(3, 0, {255, 100, 7, 50});
+    source.SetColor(4, 3, {255, 255, 255, 0});
     Bind({source});
     SharedShader<MKBitmapShaderColorClamp> const shader;
     shader->uProjectionMatrix = GetProjection();
@@ -171,8 +172,8 @@ TEST_F(ShaderTest, TheClampKeepsColoursBelowAlphaAndTouchesNothingElse) {
 }
 
 TEST_F(ShaderTest, TheBlenderMixesAndIgnoresCoverageAndColours) {
-    Image const first = MakeSource(3);
-    Image const second = MakeSource(4);
+    Picture const first = MakeSource(3);
+    Picture const second = MakeSource(4);
     Bind({first, second});
     SharedShader<MKBlenderBitmapsShader> const shader;
     shader->uProjectionMatrix = GetProjection();
@@ -190,7 +191,7 @@ TEST_F(ShaderTest, TheBlenderMixesAndIgnoresCoverageAndColours) {
 }
 
 TEST_F(ShaderTest, TheTextMaskDrawsItsColourWhereTheMaskIs) {
-    Image const mask = MakeSource(0);
+    Picture const mask = MakeSource(0);
     Bind({mask});
     SharedShader<MKTextMaskBitmapShader> const shader;
     shader->uProjectionMatrix = GetProjection();
@@ -204,14 +205,14 @@ TEST_F(ShaderTest, TheTextMaskDrawsItsColourWhereTheMaskIs) {
 }
 
 TEST_F(ShaderTest, OneBitmapOverAnotherLeavesNotPremultiplied) {
-    Image const source = MakeSource(1);
-    Image const destination = MakeSource(6);
+    Picture const source = MakeSource(1);
+    Picture const destination = MakeSource(6);
     Bind({source, destination});
     SharedShader<MKNonPremultipliedColorShader> const shader;
     shader->projectionMatrix = GetProjection();
     shader->srcTexture = 0;
     shader->dstTexture = 1;
-    Image const drawn = DrawWhole();
+    Picture const drawn = DrawWhole();
     Expect(drawn, [&](double x, double y) {
         Rgba const s = At(source, x, y);
         Rgba const f = s + At(destination, x, y) * (1 - s.a);
@@ -222,7 +223,7 @@ TEST_F(ShaderTest, OneBitmapOverAnotherLeavesNotPremultiplied) {
 }
 
 TEST_F(ShaderTest, TheBlurWeighsFourNeighboursOnEachSideOfOneAxis) {
-    Image const source = MakeSource(2);
+    Picture const source = MakeSource(2);
     Bind({source});
     SharedShader<MKGaussianBlurShader> const shader;
     shader->projectionMatrix = GetProjection();
@@ -256,9 +257,9 @@ TEST_F(ShaderTest, AFragmentOnACirclesOutermostEdgeIsKeptAndCoversNothing) {
     shader->uIsFill = 1;
     shader->uCenter = Vector2<float>(0.5f, 0.5f);
     shader->uRadius = 4.5f; // the centre of pixel 5 lies 5 away
-    Image const drawn = Draw([](float x, float y) { return std::vector<float>{x, y}; });
-    EXPECT_EQ(drawn.At(5, 0), kClear);
-    EXPECT_EQ(drawn.At(6, 0), kBackground);
+    Picture const drawn = Draw([](float x, float y) { return std::vector<float>{x, y}; });
+    EXPECT_EQ(drawn.GetColor(5, 0), kClear);
+    EXPECT_EQ(drawn.GetColor(6, 0), kBackground);
 }
 
 } // namespace

@@ -39,7 +39,7 @@ struct Holders {
 class EveryPrimitive {
 public:
     EveryPrimitive(IGLMsgQueue* queue, Holders& holders) : mQueue(queue), mHolders(holders) {
-        TestImage const picture = MakeGradient(16, 16);
+        Picture const picture = MakeGradient(16, 16);
         mPicture = NewBitmap(16, 16, picture.pixels.data());
         mQueue->WaitForTasks(); // the image may go
         AddShapes();
@@ -48,9 +48,9 @@ public:
         AddClip();
     }
 
-    TestImage Draw() {
+    Picture Draw() {
         int const rows = (static_cast<int>(mCells.size()) + kColumns - 1) / kColumns;
-        TestImage image(kColumns * kCell, rows * kCell);
+        Picture image(kColumns * kCell, rows * kCell);
         mHolders.target = NewBitmap(image.width, image.height, nullptr);
         mHolders.canvas = Moka::NewCanvas(*mQueue, mHolders.target);
         for (std::size_t i = 0; i < mCells.size(); ++i) {
@@ -64,11 +64,11 @@ public:
         return image;
     }
 
-    void ExpectSame(TestImage const& expected, TestImage const& actual, int round) const {
-        TestImage const empty(kCell, kCell);
+    void ExpectSame(Picture const& expected, Picture const& actual, int round) const {
+        Picture const empty(kCell, kCell);
         for (std::size_t i = 0; i < mCells.size(); ++i) {
             auto const [x, y] = Place(static_cast<int>(i));
-            TestImage const wanted = expected.Crop(x, y, kCell, kCell);
+            Picture const wanted = expected.Crop(x, y, kCell, kCell);
             EXPECT_GT(CompareImages(empty, wanted).differingPixels, 0) << mCells[i].name;
             EXPECT_EQ(CompareImages(wanted, actual.Crop(x, y, kCell, kCell)).differingPixels, 0)
                 << mCells[i].name << " of start " << round;
@@ -150,14 +150,14 @@ TEST(Restart, EveryPrimitiveIsDrawnWhileCanvasesOfStoppedThreadsHoldTheirProgram
     // Reachable for good: never released, like what an application has forgotten.
     static auto& leaked = *new std::vector<Holders>;
     LogCapture const log;
-    TestImage first(0, 0);
+    Picture first(0, 0);
     for (int round = 0; round <= 5; ++round) {
         std::string error;
         auto const thread = RenderThread::Start({{}, true, 1, 1}, &error);
         ASSERT_TRUE(thread) << error;
         leaked.emplace_back();
         EveryPrimitive everything(thread.get(), leaked.back());
-        TestImage const picture = everything.Draw();
+        Picture const picture = everything.Draw();
         if (round == 0) first = picture;
         everything.ExpectSame(first, picture, round);
     }

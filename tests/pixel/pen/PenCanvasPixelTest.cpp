@@ -33,14 +33,14 @@ constexpr int kHeight = 26;
 constexpr Color kPaper{10, 20, 30, 255};
 constexpr Color kInk{0, 255, 0, 255};
 
-TestImage Paper() { return MakeChecker(kWidth, kHeight, kWidth + kHeight, kPaper, kPaper); }
+Picture Paper() { return MakeChecker(kWidth, kHeight, kWidth + kHeight, kPaper, kPaper); }
 
-void FillImage(TestImage& image, Rect const& r, Color const& color) {
+void FillImage(Picture& image, Rect const& r, Color const& color) {
     for (int y = r.top; y < r.bottom; ++y)
         for (int x = r.left; x < r.right; ++x) image.SetColor(x, y, color);
 }
 
-void FillGradient(TestImage& image, Rect const& r) {
+void FillGradient(Picture& image, Rect const& r) {
     for (int y = r.top; y < r.bottom; ++y)
         for (int x = r.left; x < r.right; ++x) image.SetColor(x, y, GetGradientColor(x - r.left, y - r.top));
 }
@@ -79,14 +79,14 @@ protected:
         for (std::string const& line : log.GetTexts(ANDROID_LOG_ERROR)) ADD_FAILURE() << line;
     }
 
-    BitmapPtr Create(TestImage const& image) {
+    BitmapPtr Create(Picture const& image) {
         auto created = NewBitmap(*queue, image.width, image.height, image.pixels.data());
         queue->WaitForTasks(); // the image may go
         return created;
     }
 
-    TestImage Read() {
-        TestImage image(kWidth, kHeight);
+    Picture Read() {
+        Picture image(kWidth, kHeight);
         bitmap->GetBitmapData(bitmap->GetBitmapRect(), image.pixels.data());
         return image;
     }
@@ -103,7 +103,7 @@ protected:
         });
     }
 
-    static void ExpectSame(TestImage const& expected, TestImage const& actual, std::string const& what) {
+    static void ExpectSame(Picture const& expected, Picture const& actual, std::string const& what) {
         ImageDifference const difference = CompareImages(expected, actual);
         if (difference.differingPixels == 0) return;
         ADD_FAILURE() << what << ": " << difference << "; " << KeepDifference(expected, actual, what);
@@ -139,7 +139,7 @@ TEST_P(PenCanvasPixel, InkIsDrawnInsideTheClipAndNotOutside) {
         pen->PreScale(2, 1);
         DrawInk(RectF(0, 0, 10, 10)); // covers (4, 2) to (24, 12)
         pen->Restore(level);
-        TestImage expected = Paper();
+        Picture expected = Paper();
         FillImage(expected, c.inked, kInk);
         ExpectSame(expected, Read(), "ink under " + std::to_string(c.clips.size()) + " clips");
     }
@@ -151,7 +151,7 @@ TEST_P(PenCanvasPixel, ATurnedClipAnnouncesItselfAndCutsNothing) {
     pen->PreRotate(30, 20, 13);
     pen->SetClipRect(18, 11, 4, 4, C::Intersect);
     DrawInk(RectF(-100, -100, 100, 100));
-    TestImage expected(kWidth, kHeight);
+    Picture expected(kWidth, kHeight);
     FillImage(expected, Rect(0, 0, kWidth, kHeight), kInk);
     ExpectSame(expected, Read(), "ink under a turned clip");
     EXPECT_EQ(log.GetTexts(ANDROID_LOG_WARN).size(), 2u);
@@ -173,7 +173,7 @@ TEST_P(PenCanvasPixel, TheMatrixMapsAsTheCanvasDoes) {
     MKPaint paint;
     paint.SetColor(static_cast<int>(0xFF00FF00));
     canvas->DrawRect(rect, &paint);
-    TestImage const drawn = Read();
+    Picture const drawn = Read();
     canvas->ClearAll(10 / 255.0f, 20 / 255.0f, 30 / 255.0f, 1);
     DrawInk(rect);
     ExpectSame(drawn, Read(), "ink where the canvas draws");
@@ -185,7 +185,7 @@ TEST_P(PenCanvasPixel, TheMatrixMapsAsTheCanvasDoes) {
 TEST_P(PenCanvasPixel, OwnDrawsBeforeAndAfterAreRightWhateverIsLeftBehind) {
     Color const white{255, 255, 255, 255};
     Color const red{255, 0, 0, 255};
-    TestImage expected = Paper();
+    Picture expected = Paper();
     BitmapPtr const picture = Create(MakeGradient(6, 5));
     MKPaint paint;
     canvas->DrawRect(2, 2, 30, 8, &paint); // still in the renderer's hands when the pen comes

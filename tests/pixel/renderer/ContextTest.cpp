@@ -61,8 +61,8 @@ TEST_F(ContextTest, WithoutAContextNothingIsMade) {
 }
 
 TEST_F(ContextTest, ObjectsThatOutliveTheirContextAreInertInTheNextOne) {
-    TexturePtr texture = MakeTexture(Image(4, 4, kRed));
-    TexturePtr elsewhere = MakeTexture(Image(4, 4, kRed));
+    TexturePtr texture = MakeTexture(MakeImage(4, 4, kRed));
+    TexturePtr elsewhere = MakeTexture(MakeImage(4, 4, kRed));
     TargetPtr target = MakeTarget(*texture);
     DepthStencilPtr buffer = MakeDepthStencil(4, 4);
     target->AttachDepthStencil(buffer.get());
@@ -73,20 +73,20 @@ TEST_F(ContextTest, ObjectsThatOutliveTheirContextAreInertInTheNextOne) {
 
     // The new context hands out the same small names again.
     std::vector<TexturePtr> strangers;
-    for (int i = 0; i < 4; ++i) strangers.push_back(MakeTexture(Image(4, 4, kGreen)));
+    for (int i = 0; i < 4; ++i) strangers.push_back(MakeTexture(MakeImage(4, 4, kGreen)));
     TargetPtr const strangersTarget = MakeTarget(*strangers[0]);
     DepthStencilPtr const strangersBuffer = MakeDepthStencil(4, 4);
     strangersTarget->AttachDepthStencil(strangersBuffer.get());
 
     texture->SetLabel("old");
     texture->Bind(0);
-    texture->Replace(Image(4, 4, kBlue).pixels.data(), 0);
+    texture->Replace(MakeImage(4, 4, kBlue).pixels.data(), 0);
     texture->DrawToCurrent();
     texture->CopyFromRenderTarget();
     target->Activate();
     target->ClearColor(0, 0, 1, 1);
     target->ClearDepthStencil(true, 1, true, 1);
-    EXPECT_EQ(Read(*target, 4, 4), Image(4, 4));
+    EXPECT_EQ(Read(*target, 4, 4), MakeImage(4, 4));
     target->Deactivate(true, true);
     EXPECT_FALSE(MakeView(*texture));
     EXPECT_FALSE(MakeTarget(*texture));
@@ -97,7 +97,7 @@ TEST_F(ContextTest, ObjectsThatOutliveTheirContextAreInertInTheNextOne) {
     texture.reset();
     RendererFactory::Flush();
 
-    for (TexturePtr const& stranger : strangers) EXPECT_EQ(Read(*stranger), Image(4, 4, kGreen));
+    for (TexturePtr const& stranger : strangers) EXPECT_EQ(Read(*stranger), MakeImage(4, 4, kGreen));
     EXPECT_EQ(RendererFactory::GetStatistics().textures, 4);
     EXPECT_EQ(RendererFactory::GetStatistics().renderTargets, 1);
 }
@@ -105,7 +105,7 @@ TEST_F(ContextTest, ObjectsThatOutliveTheirContextAreInertInTheNextOne) {
 TEST_F(ContextTest, DetachingGivesTheHostItsFrameBufferBackAndDeletesWhatWaits) {
     HostFrameBuffer const host(4, 4);
     RendererFactory::SetDeferred(true);
-    TexturePtr texture = MakeTexture(Image(4, 4, kRed));
+    TexturePtr texture = MakeTexture(MakeImage(4, 4, kRed));
     TargetPtr target = MakeTarget(*texture);
     MakeDepthStencil(4, 4).reset();
     target->Activate();
@@ -126,7 +126,7 @@ TEST_F(ContextTest, DeferredTheHostGetsItsFrameBufferBackAtTheFlushOnly) {
     glViewport(1, 2, 3, 4);
     RendererFactory::InvalidateState();
     RendererFactory::SetDeferred(true);
-    auto const [texture, target] = MakeOffscreen(Image(4, 4));
+    auto const [texture, target] = MakeOffscreen(MakeImage(4, 4));
     RendererFactory::Flush();
     std::uint64_t const before = RendererFactory::GetStatistics().frameBufferSwitches;
     for (int i = 0; i < 10; ++i) {

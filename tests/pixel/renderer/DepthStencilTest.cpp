@@ -17,7 +17,7 @@ protected:
         quad.Draw();
         glDisable(GL_STENCIL_TEST);
         image.target->Deactivate(false, false);
-        return Read(*image.texture) == Image(4, 4, kRed);
+        return Read(*image.texture) == MakeImage(4, 4, kRed);
     }
 
     static GLint GetAttachment(OffscreenImage const& image) {
@@ -31,7 +31,7 @@ protected:
 };
 
 TEST_F(DepthStencilTest, ClearingIgnoresTheWriteMasksAndKeepsThem) {
-    OffscreenImage const image = MakeOffscreen(Image(4, 4, kGreen));
+    OffscreenImage const image = MakeOffscreen(MakeImage(4, 4, kGreen));
     image.target->ClearDepthStencil(true, 1, true, 1); // there is none yet
     EXPECT_EQ(RendererFactory::GetStatistics().clears, 0u);
     DepthStencilPtr const buffer = MakeDepthStencil(4, 4);
@@ -54,8 +54,8 @@ TEST_F(DepthStencilTest, ClearingIgnoresTheWriteMasksAndKeepsThem) {
 }
 
 TEST_F(DepthStencilTest, ABufferIsAttachedToTheTargetThatTookItLastUntilEitherGoes) {
-    OffscreenImage image = MakeOffscreen(Image(4, 4));
-    OffscreenImage const other = MakeOffscreen(Image(4, 4));
+    OffscreenImage image = MakeOffscreen(MakeImage(4, 4));
+    OffscreenImage const other = MakeOffscreen(MakeImage(4, 4));
     DepthStencilPtr first = MakeDepthStencil(4, 4);
     DepthStencilPtr second = MakeDepthStencil(4, 4);
     image.target->AttachDepthStencil(first.get());
@@ -80,7 +80,7 @@ TEST_F(DepthStencilTest, ABufferIsAttachedToTheTargetThatTookItLastUntilEitherGo
 }
 
 TEST_F(DepthStencilTest, WhatDoesNotFitIsRefusedWithALine) {
-    OffscreenImage const image = MakeOffscreen(Image(4, 4));
+    OffscreenImage const image = MakeOffscreen(MakeImage(4, 4));
     HostFrameBuffer const host(4, 4);
     OffscreenImage const hosts{nullptr, TargetPtr(RendererFactory::CreateRenderTargetFromCurrent(4, 4))};
     GLint const bound = GetInteger(GL_RENDERBUFFER_BINDING);
@@ -99,7 +99,7 @@ TEST_F(DepthStencilTest, WhatDoesNotFitIsRefusedWithALine) {
 }
 
 TEST_F(DepthStencilTest, AClipThatComesBackFindsTheSameRenderBufferAmongTheLastFew) {
-    OffscreenImage const image = MakeOffscreen(Image(4, 4));
+    OffscreenImage const image = MakeOffscreen(MakeImage(4, 4));
     GLint first = 0;
     for (int i = 0; i < 3; ++i) {
         DepthStencilPtr const buffer = MakeDepthStencil(4, 4);

@@ -82,10 +82,10 @@ protected:
         float const corners[] = {l, t, l, b, r, t, r, t, l, b, r, b};
         quad->SetVertices(0, corners, 6);
     }
-    void Fill(Pixel color, float l, float t, float r, float b) const {
-        std::array<float, 4> const value{static_cast<float>(color.r) / 255, static_cast<float>(color.g) / 255,
-                                         static_cast<float>(color.b) / 255,
-                                         static_cast<float>(color.a) / 255};
+    void Fill(Color color, float l, float t, float r, float b) const {
+        std::array<float, 4> const value{
+            static_cast<float>(color[0]) / 255, static_cast<float>(color[1]) / 255,
+            static_cast<float>(color[2]) / 255, static_cast<float>(color[3]) / 255};
         colored->program->MakeCurrent();
         colored->parameter->Set(value.data());
         SetQuad(l, t, r, b);
@@ -106,10 +106,10 @@ protected:
         stencil->SetDescriptor(descriptor);
         stencil->Apply();
     }
-    Image Read() { return RendererFixture::Read(*target, kSize, kSize); }
-    static Image Filled(Pixel color) { return Image(kSize, kSize, color); }
-    static Image With(Image image, Pixel color, int x, int y, int w, int h) {
-        return image.With(x, y, Image(w, h, color), 0, 0, w, h);
+    Picture Read() { return RendererFixture::Read(*target, kSize, kSize); }
+    static Picture Filled(Color color) { return MakeImage(kSize, kSize, color); }
+    static Picture With(Picture image, Color color, int x, int y, int w, int h) {
+        return image.With(x, y, MakeImage(w, h, color));
     }
     static RendererStatistics Count() { return RendererFactory::GetStatistics(); }
     static bool IsDeferred() { return GetParam(); }

@@ -95,7 +95,7 @@ TEST_P(DrawStateTest, WithoutAnActiveTargetTheHostsFrameBufferIsDrawnInto) {
     Clear(*target, kBlue);
     Fill(kRed, 0, 0, 8, 4);
     RendererFactory::Flush();
-    EXPECT_EQ(host.Read().At(1, 1), kRed);
+    EXPECT_EQ(host.Read().GetColor(1, 1), kRed);
     EXPECT_EQ(Read(), Filled(kBlue));
 }
 

@@ -56,8 +56,8 @@ TEST_P(DrawTest, CountsAndFirstAreCutToWhatIsThere) {
     EXPECT_TRUE(quad->Draw(3, 3, 1));
     EXPECT_TRUE(quad->Draw(9, -1, 1));
     EXPECT_TRUE(quad->Draw(0, 0, 1));
-    EXPECT_EQ(Read().At(1, 1), kClear);
-    EXPECT_EQ(Read().At(0, 6), kRed);
+    EXPECT_EQ(Read().GetColor(1, 1), kClear);
+    EXPECT_EQ(Read().GetColor(0, 6), kRed);
     quad->SetVertices(0, nullptr, 0);
     target->ClearColor(0, 0, 0, 0);
     EXPECT_TRUE(quad->Draw(0, -1, 1));
@@ -104,7 +104,7 @@ TEST_P(DrawTest, TransfersComeBetweenTheDrawsWhereTheyWereAskedFor) {
     Fill(kRed, 0, 6, 8, 8);
     Paint(*copy, 0, 6, 8, 7);
     target->Deactivate(false, false);
-    Image const half =
+    Picture const half =
         With(With(With(Filled(kClear), kRed, 0, 0, 4, 4), kGreen, 4, 0, 4, 4), kBlue, 0, 4, 8, 2);
     EXPECT_EQ(RendererFixture::Read(*copy), half);
     EXPECT_EQ(Read(), With(half, kRed, 0, 7, 8, 1));
@@ -114,8 +114,8 @@ TEST_P(DrawTest, TexturesThatAreDeletedOrReboundAreStillThereForTheDrawsBefore) 
     target->Activate();
     for (int i = 0; i < 3; ++i) {
         // The GL names of the last one may come back here.
-        Pixel const color = i == 0 ? kRed : i == 1 ? kGreen : kBlue;
-        TexturePtr const source = MakeTexture(Image(2, 2, color));
+        Color const color = i == 0 ? kRed : i == 1 ? kGreen : kBlue;
+        TexturePtr const source = MakeTexture(MakeImage(2, 2, color));
         source->SetParameter(TextureParamWrappingS, i == 1 ? TextureWrapRepeat : TextureWrapClampToEdge);
         Paint(*source, static_cast<float>(i), 0, static_cast<float>(i + 1), 8);
     }
@@ -143,7 +143,7 @@ TEST_P(DrawTest, AFullListIsPlayedAndALaterFrameAsksNothingAndGrowsNothing) {
     RendererStatistics const before = Count();
     drawFrame();
     RendererStatistics const after = Count();
-    EXPECT_EQ(Read().At((kDraws - 1) % kSize, 3), (kDraws - 1) % 3 == 0 ? kRed : kGreen);
+    EXPECT_EQ(Read().GetColor((kDraws - 1) % kSize, 3), (kDraws - 1) % 3 == 0 ? kRed : kGreen);
     EXPECT_EQ(after.listBytes, before.listBytes);
     EXPECT_LT(after.listBytes, 8u << 20);
     EXPECT_EQ(after.buffers, before.buffers);

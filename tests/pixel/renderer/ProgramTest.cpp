@@ -44,7 +44,7 @@ class ProgramTest : public RendererFixture {
 protected:
     void SetUp() override {
         RendererFixture::SetUp();
-        mImage = MakeOffscreen(Image(2, 2));
+        mImage = MakeOffscreen(MakeImage(2, 2));
         mImage.target->Activate();
     }
     void TearDown() override {
@@ -53,14 +53,14 @@ protected:
     }
 
     // What the current program draws over the whole target.
-    Pixel Draw() {
+    Color Draw() {
         Clear(*mImage.target, kClear);
         RendererFactory::Commit();
         DrawRawStrip({{2, {-1, -1, 1, -1, -1, 1, 1, 1}}});
         RendererFactory::InvalidateState();
-        Image const image = Read(*mImage.target, 2, 2);
-        EXPECT_EQ(image, Image(2, 2, image.At(0, 0)));
-        return image.At(0, 0);
+        Picture const image = Read(*mImage.target, 2, 2);
+        EXPECT_EQ(image, MakeImage(2, 2, image.GetColor(0, 0)));
+        return image.GetColor(0, 0);
     }
 
     OffscreenImage mImage;
@@ -105,7 +105,7 @@ TEST_F(ProgramTest, EveryTypeIsReportedAndArrivesWhole) {
     program->MakeCurrent();
     // Column-major: the third column.
     Set(all["matrix"], Numbers{9, 9, 9, 9, 9, 9, 9, 9, 1, 0, 0.2f, 1, 9, 9, 9, 9});
-    EXPECT_EQ(Draw(), (Pixel{255, 0, 51, 255}));
+    EXPECT_EQ(Draw(), (Color{255, 0, 51, 255}));
     Set(all["count"], -7);
     Set(all["pair"], Numbers{0.2f, 1});
     Set(all["number"], 0.6f);
@@ -115,16 +115,16 @@ TEST_F(ProgramTest, EveryTypeIsReportedAndArrivesWhole) {
         unsigned char strangers[3] = {0xFF, 0xFF, 0xFF};
     } bools;
     all["flag"]->Set(&bools.value);
-    EXPECT_EQ(Draw(), (Pixel{51, 255, 153, 255}));
+    EXPECT_EQ(Draw(), (Color{51, 255, 153, 255}));
     bools.value = false;
     all["flag"]->Set(&bools.value);
-    EXPECT_EQ(Draw(), (Pixel{51, 255, 153, 0}));
+    EXPECT_EQ(Draw(), (Color{51, 255, 153, 0}));
     Set(all["count"], 2);
     Set(all["quad"], Numbers{1, 0.8f, 0.4f, 0.2f});
-    EXPECT_EQ(Draw(), (Pixel{255, 204, 102, 51}));
+    EXPECT_EQ(Draw(), (Color{255, 204, 102, 51}));
     Set(all["count"], 3);
-    TexturePtr const green = MakeTexture(Image(1, 1, kGreen));
-    TexturePtr const blue = MakeTexture(Image(1, 1, kBlue));
+    TexturePtr const green = MakeTexture(MakeImage(1, 1, kGreen));
+    TexturePtr const blue = MakeTexture(MakeImage(1, 1, kBlue));
     green->Bind(0);
     blue->Bind(3);
     EXPECT_EQ(Draw(), kGreen);
@@ -273,7 +273,7 @@ TEST_F(ProgramTest, InTheNextContextItIsBuiltAgainWithItsHandlesAndValues) {
     program->MakeCurrent(); // there is no context to be built in
     RestartEgl();
     ASSERT_TRUE(Attach());
-    mImage = MakeOffscreen(Image(2, 2));
+    mImage = MakeOffscreen(MakeImage(2, 2));
     mImage.target->Activate();
     ProgramPtr const other = MakeProgram(kVertex, kUniformColor);
     other->MakeCurrent();

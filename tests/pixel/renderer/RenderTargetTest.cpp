@@ -23,8 +23,8 @@ TEST_F(RenderTargetTest, TheHostFindsItsFrameBuffersAndViewportAgainAfterAnyNest
     auto const read = static_cast<GLint>(reading.GetName());
     glBindFramebuffer(GL_READ_FRAMEBUFFER, reading.GetName());
     glViewport(3, 5, 7, 11);
-    auto [texture, target] = MakeOffscreen(Image(9, 8));
-    auto const [otherTexture, other] = MakeOffscreen(Image(5, 6));
+    auto [texture, target] = MakeOffscreen(MakeImage(9, 8));
+    auto const [otherTexture, other] = MakeOffscreen(MakeImage(5, 6));
 
     target->Activate();
     GLint const ours = GetDrawBinding();
@@ -54,8 +54,8 @@ TEST_F(RenderTargetTest, TheHostFindsItsFrameBuffersAndViewportAgainAfterAnyNest
 }
 
 TEST_F(RenderTargetTest, OperationsOnOtherTargetsLeaveTheActiveOneActive) {
-    auto const [texture, target] = MakeOffscreen(Image(4, 4));
-    OffscreenImage const other = MakeOffscreen(Image(4, 4));
+    auto const [texture, target] = MakeOffscreen(MakeImage(4, 4));
+    OffscreenImage const other = MakeOffscreen(MakeImage(4, 4));
     DepthStencilPtr const buffer = MakeDepthStencil(4, 4);
     TexturePtr fresh;
     target->Activate();
@@ -76,11 +76,11 @@ TEST_F(RenderTargetTest, OperationsOnOtherTargetsLeaveTheActiveOneActive) {
         EXPECT_EQ(GetDrawBinding(), ours) << i;
         EXPECT_EQ(GetReadBinding(), ours) << i;
     }
-    EXPECT_EQ(Read(*other.texture), Image(4, 4, kRed));
+    EXPECT_EQ(Read(*other.texture), MakeImage(4, 4, kRed));
 }
 
 TEST_F(RenderTargetTest, InvertedTrianglesAreDrawnWhateverTheHostCullsAndTheHostGetsItBack) {
-    auto const [texture, target] = MakeOffscreen(Image(3, 3));
+    auto const [texture, target] = MakeOffscreen(MakeImage(3, 3));
     RawQuad const quad("color = vec4(1, 0, 0, 1);");
     glCullFace(GL_FRONT_AND_BACK);
     glDepthFunc(GL_NEVER);
@@ -91,31 +91,31 @@ TEST_F(RenderTargetTest, InvertedTrianglesAreDrawnWhateverTheHostCullsAndTheHost
     target->Activate();
     quad.Draw();
     target->Deactivate(false, false);
-    EXPECT_EQ(Read(*texture), Image(3, 3, kRed));
+    EXPECT_EQ(Read(*texture), MakeImage(3, 3, kRed));
     for (GLenum obstacle : kObstacles) EXPECT_TRUE(glIsEnabled(obstacle)) << obstacle;
 }
 
 TEST_F(RenderTargetTest, ATargetMadeAfterADeletionIsBoundAnew) {
     RendererFactory::SetDeferred(true); // so that the shadow is trusted from call to call
-    for (Pixel color : {kRed, kGreen, kBlue}) {
+    for (Color color : {kRed, kGreen, kBlue}) {
         // Deactivated but still bound when its frame buffer goes, whose name the next one may get.
-        auto const [texture, target] = MakeOffscreen(Image(2, 2));
+        auto const [texture, target] = MakeOffscreen(MakeImage(2, 2));
         target->Activate();
         Clear(*target, color);
         target->Deactivate(false, false);
-        EXPECT_EQ(Read(*target, 2, 2), Image(2, 2, color));
+        EXPECT_EQ(Read(*target, 2, 2), MakeImage(2, 2, color));
     }
 }
 
 TEST_F(RenderTargetTest, ClearColorIgnoresTheColourMaskAndObeysTheScissor) {
-    auto const [texture, target] = MakeOffscreen(Image(8, 6, kGreen));
+    auto const [texture, target] = MakeOffscreen(MakeImage(8, 6, kGreen));
     glClearColor(0.25f, 0.5f, 0.75f, 1);
     glColorMask(GL_FALSE, GL_FALSE, GL_FALSE, GL_FALSE);
     glEnable(GL_SCISSOR_TEST);
     glScissor(2, 1, 3, 2);
     glEnable(GL_RASTERIZER_DISCARD);
     Clear(*target, kRed);
-    EXPECT_EQ(Read(*texture), Image(8, 6, kGreen).With(2, 1, Image(3, 2, kRed), 0, 0, 3, 2));
+    EXPECT_EQ(Read(*texture), MakeImage(8, 6, kGreen).With(2, 1, MakeImage(3, 2, kRed)));
 
     EXPECT_EQ(GetColorMask(), (ColorMask{0, 0, 0, 0}));
     GLfloat color[4];
@@ -124,15 +124,15 @@ TEST_F(RenderTargetTest, ClearColorIgnoresTheColourMaskAndObeysTheScissor) {
     EXPECT_TRUE(glIsEnabled(GL_RASTERIZER_DISCARD));
 
     glDisable(GL_SCISSOR_TEST);
-    Clear(*target, Pixel{1, 2, 3, 4});
-    EXPECT_EQ(Read(*texture), Image(8, 6, Pixel{1, 2, 3, 4}));
+    Clear(*target, Color{1, 2, 3, 4});
+    EXPECT_EQ(Read(*texture), MakeImage(8, 6, Color{1, 2, 3, 4}));
 }
 
 TEST_F(RenderTargetTest, TheHostsFrameBufferIsCapturedAndNeverDeleted) {
     HostFrameBuffer const host(4, 4);
     HostFrameBuffer const later(4, 4);
     glBindFramebuffer(GL_FRAMEBUFFER, host.GetName());
-    auto [texture, target] = MakeOffscreen(Image(4, 4, kClear));
+    auto [texture, target] = MakeOffscreen(MakeImage(4, 4, kClear));
     TargetPtr fromDefault(RendererFactory::CreateRenderTargetFromDefault(4, 4));
     TargetPtr fromCurrent(RendererFactory::CreateRenderTargetFromCurrent(4, 4));
     target->Activate(); // beneath it default is still the host's, and current is the target's
@@ -142,14 +142,14 @@ TEST_F(RenderTargetTest, TheHostsFrameBufferIsCapturedAndNeverDeleted) {
     glBindFramebuffer(GL_FRAMEBUFFER, later.GetName());
     IRenderTarget* const hosts[] = {fromDefault.get(), fromCurrent.get(), defaultBeneath.get()};
     for (int i = 0; i < 3; ++i) {
-        Pixel const color = i == 0 ? kRed : i == 1 ? kBlue : kGreen;
+        Color const color = i == 0 ? kRed : i == 1 ? kBlue : kGreen;
         Clear(*hosts[i], color);
-        EXPECT_EQ(host.Read(), Image(4, 4, color)) << i;
+        EXPECT_EQ(host.Read(), MakeImage(4, 4, color)) << i;
     }
     Clear(*currentBeneath, kRed);
-    EXPECT_EQ(Read(*texture), Image(4, 4, kRed));
-    EXPECT_EQ(Read(*fromDefault, 4, 4), Image(4, 4, kGreen));
-    EXPECT_EQ(later.Read(), Image(4, 4));
+    EXPECT_EQ(Read(*texture), MakeImage(4, 4, kRed));
+    EXPECT_EQ(Read(*fromDefault, 4, 4), MakeImage(4, 4, kGreen));
+    EXPECT_EQ(later.Read(), MakeImage(4, 4));
     fromDefault.reset();
     fromCurrent.reset();
     EXPECT_TRUE(glIsFramebuffer(host.GetName()));
@@ -157,7 +157,7 @@ TEST_F(RenderTargetTest, TheHostsFrameBufferIsCapturedAndNeverDeleted) {
 
 TEST_F(RenderTargetTest, DiscardingNamesThePartsByTheKindOfTheFrameBuffer) {
     // The fixture fails on any GL error, which the wrong names would be.
-    auto const [texture, target] = MakeOffscreen(Image(4, 4));
+    auto const [texture, target] = MakeOffscreen(MakeImage(4, 4));
     DepthStencilPtr const buffer = MakeDepthStencil(4, 4);
     target->AttachDepthStencil(buffer.get());
     HostFrameBuffer const host(4, 4);
@@ -175,7 +175,7 @@ TEST_F(RenderTargetTest, DiscardingNamesThePartsByTheKindOfTheFrameBuffer) {
     Clear(*target, kBlue);
     target->Activate();
     target->Deactivate(false, true);
-    EXPECT_EQ(Read(*texture), Image(4, 4, kBlue));
+    EXPECT_EQ(Read(*texture), MakeImage(4, 4, kBlue));
 }
 
 TEST_F(RenderTargetTest, ADriverErrorIsLoggedCountedAndHarmless) {
@@ -184,9 +184,9 @@ TEST_F(RenderTargetTest, ADriverErrorIsLoggedCountedAndHarmless) {
     glGenFramebuffers(1, &incomplete);
     glBindFramebuffer(GL_FRAMEBUFFER, incomplete);
     TargetPtr const target(RendererFactory::CreateRenderTargetFromCurrent(4, 4));
-    Image image(4, 4);
+    Picture image = MakeImage(4, 4);
     target->ReadPixels(0, 0, 4, 4, {image.pixels.data(), 4, 0, 0});
-    EXPECT_EQ(image, Image(4, 4));
+    EXPECT_EQ(image, MakeImage(4, 4));
     EXPECT_GE(RendererFactory::GetStatistics().errors, 1u);
     EXPECT_GE(TakeErrors().size(), 1u);
     ForgetDriverErrors();

@@ -4,45 +4,27 @@
 #include "moka/base/log/LogSink.h"
 #include "tests/support/NothingLeft.h"
 
-#include <ostream>
 #include <utility>
 
 namespace Moka::Testing {
 
-std::ostream& operator<<(std::ostream& out, Pixel const& pixel) {
-    return out << '(' << int{pixel.r} << ' ' << int{pixel.g} << ' ' << int{pixel.b} << ' ' << int{pixel.a}
-               << ')';
-}
-
-Image Image::Pattern(int width, int height) {
-    Image image(width, height);
-    for (int y = 0; y < height; ++y) {
-        for (int x = 0; x < width; ++x) {
-            auto const high = static_cast<std::uint8_t>((x >> 8) * 16 + (y >> 8));
-            image.At(x, y) = {static_cast<std::uint8_t>(x), static_cast<std::uint8_t>(y), high,
-                              static_cast<std::uint8_t>(7 * x + 13 * y + 1)};
-        }
-    }
+Picture MakeImage(int width, int height, Color const& fill) {
+    Picture image(width, height);
+    for (std::size_t i = 0; i < image.pixels.size(); ++i) image.pixels[i] = fill[i % 4];
     return image;
 }
 
-Image Image::With(int x, int y, Image const& source, int sourceX, int sourceY, int w, int h) const {
-    Image result = *this;
-    for (int row = 0; row < h; ++row) {
-        for (int column = 0; column < w; ++column) {
-            result.At(x + column, y + row) = source.At(sourceX + column, sourceY + row);
+Picture MakePattern(int width, int height) {
+    Picture image(width, height);
+    for (int y = 0; y < height; ++y) {
+        for (int x = 0; x < width; ++x) {
+            auto const high = static_cast<std::uint8_t>((x >> 8) * 16 + (y >> 8));
+            image.SetColor(x, y,
+                           {static_cast<std::uint8_t>(x), static_cast<std::uint8_t>(y), high,
+                            static_cast<std::uint8_t>(7 * x + 13 * y + 1)});
         }
     }
-    return result;
-}
-
-void PrintTo(Image const& image, std::ostream* out) {
-    *out << image.width << " x " << image.height;
-    if (image.pixels.size() > 256) return;
-    for (int y = 0; y < image.height; ++y) {
-        *out << "\n  ";
-        for (int x = 0; x < image.width; ++x) *out << image.At(x, y);
-    }
+    return image;
 }
 
 HostFrameBuffer::HostFrameBuffer(int width, int height, GLenum format) : mWidth(width), mHeight(height) {
@@ -61,15 +43,15 @@ HostFrameBuffer::~HostFrameBuffer() {
     glDeleteRenderbuffers(1, &mColor);
 }
 
-void HostFrameBuffer::Fill(Pixel color) const {
+void HostFrameBuffer::Fill(Color color) const {
     glBindFramebuffer(GL_FRAMEBUFFER, mName);
-    GLfloat const value[4] = {static_cast<float>(color.r) / 255, static_cast<float>(color.g) / 255,
-                              static_cast<float>(color.b) / 255, static_cast<float>(color.a) / 255};
+    GLfloat const value[4] = {static_cast<float>(color[0]) / 255, static_cast<float>(color[1]) / 255,
+                              static_cast<float>(color[2]) / 255, static_cast<float>(color[3]) / 255};
     glClearBufferfv(GL_COLOR, 0, value);
 }
 
-Image HostFrameBuffer::Read() const {
-    Image image(mWidth, mHeight);
+Picture HostFrameBuffer::Read() const {
+    Picture image = MakeImage(mWidth, mHeight);
     glBindFramebuffer(GL_FRAMEBUFFER, mName);
     glReadPixels(0, 0, mWidth, mHeight, GL_RGBA, GL_UNSIGNED_BYTE, image.pixels.data());
     return image;
@@ -121,7 +103,7 @@ TexturePtr RendererFixture::MakeTexture(int width, int height) {
     return TexturePtr(RendererFactory::CreateTextureObject(descriptor, nullptr, 0, {}));
 }
 
-TexturePtr RendererFixture::MakeTexture(Image const& image) {
+TexturePtr RendererFixture::MakeTexture(Picture const& image) {
     TextureDescriptor const descriptor(image.width, image.height, 0, 2, 6, 1, false, nullptr);
     PixelSource const source{image.pixels.data(), 0, 0, image.width};
     return TexturePtr(RendererFactory::CreateTextureObject(descriptor, nullptr, 0, source));
@@ -135,7 +117,7 @@ TargetPtr RendererFixture::MakeTarget(ITextureObject& texture) {
     return TargetPtr(RendererFactory::CreateOffscreenRenderTarget(&texture));
 }
 
-OffscreenImage RendererFixture::MakeOffscreen(Image const& image) {
+OffscreenImage RendererFixture::MakeOffscreen(Picture const& image) {
     TexturePtr texture = MakeTexture(image);
     TargetPtr target = MakeTarget(*texture);
     return {std::move(texture), std::move(target)};
@@ -145,19 +127,19 @@ DepthStencilPtr RendererFixture::MakeDepthStencil(int width, int height) {
     return DepthStencilPtr(RendererFactory::CreateDepthStencilBuffer(width, height));
 }
 
-Image RendererFixture::Read(IRenderTarget& target, int width, int height) {
-    Image image(width, height);
+Picture RendererFixture::Read(IRenderTarget& target, int width, int height) {
+    Picture image = MakeImage(width, height);
     target.ReadPixels(0, 0, width, height, {image.pixels.data(), width, 0, 0});
     return image;
 }
 
-Image RendererFixture::Read(ITextureObject& texture) {
+Picture RendererFixture::Read(ITextureObject& texture) {
     return Read(*MakeTarget(texture), texture.GetWidth(), texture.GetHeight());
 }
 
-void RendererFixture::Clear(IRenderTarget& target, Pixel color) {
-    target.ClearColor(static_cast<float>(color.r) / 255, static_cast<float>(color.g) / 255,
-                      static_cast<float>(color.b) / 255, static_cast<float>(color.a) / 255);
+void RendererFixture::Clear(IRenderTarget& target, Color color) {
+    target.ClearColor(static_cast<float>(color[0]) / 255, static_cast<float>(color[1]) / 255,
+                      static_cast<float>(color[2]) / 255, static_cast<float>(color[3]) / 255);
 }
 
 std::vector<std::string> RendererFixture::TakeErrors() { return std::exchange(mErrors, {}); }

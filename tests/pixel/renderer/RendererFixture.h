@@ -8,52 +8,31 @@
 #include "moka/renderer/IShaderProgram.h"
 #include "moka/renderer/ITextureObject.h"
 #include "moka/renderer/RendererFactory.h"
+#include "scenes/Picture.h"
 
 #include <GLES3/gl3.h>
 #include <gtest/gtest.h>
 
 #include <array>
 #include <cstdint>
-#include <iosfwd>
 #include <memory>
 #include <string>
 #include <vector>
 
 namespace Moka::Testing {
 
-struct Pixel {
-    std::uint8_t r = 0, g = 0, b = 0, a = 0;
-    friend bool operator==(Pixel const& x, Pixel const& y) {
-        return x.r == y.r && x.g == y.g && x.b == y.b && x.a == y.a;
-    }
-};
-std::ostream& operator<<(std::ostream& out, Pixel const& pixel);
+using Scenes::Color;
+using Scenes::Picture;
 
-constexpr Pixel kClear{};
-constexpr Pixel kRed{255, 0, 0, 255};
-constexpr Pixel kGreen{0, 255, 0, 255};
-constexpr Pixel kBlue{0, 0, 255, 255};
-constexpr Pixel kUntouched{0xEE, 0xDD, 0xCC, 0xBB};
+constexpr Color kClear{};
+constexpr Color kRed{255, 0, 0, 255};
+constexpr Color kGreen{0, 255, 0, 255};
+constexpr Color kBlue{0, 0, 255, 255};
+constexpr Color kUntouched{0xEE, 0xDD, 0xCC, 0xBB};
 
-struct Image {
-    int width;
-    int height;
-    std::vector<Pixel> pixels;
-
-    Image(int w, int h, Pixel fill = kUntouched)
-        : width(w), height(h), pixels(static_cast<std::size_t>(w) * static_cast<std::size_t>(h), fill) {}
-    Pixel& At(int x, int y) { return pixels[static_cast<std::size_t>(y * width + x)]; }
-    Pixel At(int x, int y) const { return pixels[static_cast<std::size_t>(y * width + x)]; }
-    friend bool operator==(Image const& a, Image const& b) {
-        return a.width == b.width && a.height == b.height && a.pixels == b.pixels;
-    }
-
-    // Every pixel different from every other.
-    static Image Pattern(int width, int height);
-    // This image with a block of another's in the place of its own.
-    Image With(int x, int y, Image const& source, int sourceX, int sourceY, int w, int h) const;
-};
-void PrintTo(Image const& image, std::ostream* out);
+Picture MakeImage(int width, int height, Color const& fill = kUntouched);
+// Every pixel different from every other.
+Picture MakePattern(int width, int height);
 
 struct Releaser {
     template <class T>
@@ -80,8 +59,8 @@ public:
     HostFrameBuffer& operator=(HostFrameBuffer const&) = delete;
 
     GLuint GetName() const { return mName; }
-    void Fill(Pixel color) const;
-    Image Read() const;
+    void Fill(Color color) const;
+    Picture Read() const;
 
 private:
     int const mWidth;
@@ -100,15 +79,15 @@ protected:
     static bool Attach(RendererLimits const& limits = {});
 
     static TexturePtr MakeTexture(int width, int height);
-    static TexturePtr MakeTexture(Image const& image);
+    static TexturePtr MakeTexture(Picture const& image);
     static TexturePtr MakeView(ITextureObject const& model);
     static TargetPtr MakeTarget(ITextureObject& texture);
-    static OffscreenImage MakeOffscreen(Image const& image);
+    static OffscreenImage MakeOffscreen(Picture const& image);
     static DepthStencilPtr MakeDepthStencil(int width, int height);
 
-    static Image Read(IRenderTarget& target, int width, int height);
-    static Image Read(ITextureObject& texture);
-    static void Clear(IRenderTarget& target, Pixel color);
+    static Picture Read(IRenderTarget& target, int width, int height);
+    static Picture Read(ITextureObject& texture);
+    static void Clear(IRenderTarget& target, Color color);
 
     // The error lines since the last call; one that nobody takes fails the test.
     std::vector<std::string> TakeErrors();

@@ -51,21 +51,22 @@ protected:
 INSTANTIATE_TEST_SUITE_P(ImmediateAndDeferred, TextureCopyTest, ::testing::Bool(), GetDrawMode);
 
 TEST_P(TextureCopyTest, ACopyOfTheTargetHasTheSmallerOfBothSizesAndNoFlip) {
-    Image const image = Image::Pattern(7, 5);
+    Picture const image = MakePattern(7, 5);
     auto const [texture, target] = MakeOffscreen(image);
     for (auto const& [width, height] : {std::pair{7, 5}, {4, 3}, {9, 8}, {4, 8}, {9, 2}}) {
-        TexturePtr const copy = MakeTexture(Image(width, height, kGreen));
+        TexturePtr const copy = MakeTexture(MakeImage(width, height, kGreen));
         target->Activate();
         copy->CopyFromRenderTarget();
         target->Deactivate(false, false);
         int const w = std::min(width, 7);
         int const h = std::min(height, 5);
-        EXPECT_EQ(Read(*copy), Image(width, height, kGreen).With(0, 0, image, 0, 0, w, h)) << width << height;
+        EXPECT_EQ(Read(*copy), MakeImage(width, height, kGreen).With(0, 0, image.Crop(0, 0, w, h)))
+            << width << height;
     }
 }
 
 TEST_P(TextureCopyTest, ACopyOfTheTargetIgnoresTheStateAndKeepsTheBindings) {
-    Image const image = Image::Pattern(6, 6);
+    Picture const image = MakePattern(6, 6);
     auto const [texture, target] = MakeOffscreen(image);
     TexturePtr const bound = MakeTexture(2, 2);
     TexturePtr const copy = MakeTexture(6, 6);
@@ -90,42 +91,42 @@ TEST_P(TextureCopyTest, ACopyOfTheTargetIgnoresTheStateAndKeepsTheBindings) {
 
 TEST_P(TextureCopyTest, ATargetWithoutAlphaIsCopiedWithAlphaOne) {
     HostFrameBuffer const host(5, 4, GL_RGB8);
-    host.Fill(Pixel{10, 20, 30, 40});
+    host.Fill(Color{10, 20, 30, 40});
     TargetPtr const target(RendererFactory::CreateRenderTargetFromCurrent(5, 4));
     glEnable(GL_SCISSOR_TEST);
     glScissor(0, 0, 1, 1);
     RendererFactory::InvalidateState();
-    TexturePtr const copy = MakeTexture(Image(6, 6, kGreen));
+    TexturePtr const copy = MakeTexture(MakeImage(6, 6, kGreen));
     target->Activate();
     copy->CopyFromRenderTarget();
     target->Deactivate(false, false);
     EXPECT_TRUE(glIsEnabled(GL_SCISSOR_TEST));
-    Image const solid(5, 4, Pixel{10, 20, 30, 255});
-    EXPECT_EQ(Read(*copy), Image(6, 6, kGreen).With(0, 0, solid, 0, 0, 5, 4));
+    Picture const solid = MakeImage(5, 4, Color{10, 20, 30, 255});
+    EXPECT_EQ(Read(*copy), MakeImage(6, 6, kGreen).With(0, 0, solid));
 }
 
 TEST_P(TextureCopyTest, WithoutAnActiveTargetTheHostsFrameBufferIsTheCurrentOne) {
     HostFrameBuffer const host(4, 3);
     RendererFactory::InvalidateState();
-    TexturePtr const texture = MakeTexture(Image::Pattern(4, 3));
+    TexturePtr const texture = MakeTexture(MakePattern(4, 3));
     TexturePtr const copy = MakeTexture(4, 3);
     { // What was active last must not be taken for it.
-        auto const [other, last] = MakeOffscreen(Image(4, 3));
+        auto const [other, last] = MakeOffscreen(MakeImage(4, 3));
         last->Activate();
         last->Deactivate(false, false);
         texture->DrawToCurrent();
         copy->CopyFromRenderTarget();
     }
     RendererFactory::Flush();
-    EXPECT_EQ(host.Read(), Image::Pattern(4, 3));
+    EXPECT_EQ(host.Read(), MakePattern(4, 3));
     RendererFactory::InvalidateState();
-    EXPECT_EQ(Read(*copy), Image::Pattern(4, 3));
+    EXPECT_EQ(Read(*copy), MakePattern(4, 3));
 }
 
 TEST_P(TextureCopyTest, ATextureDrawsItselfTexelForTexelThroughAnyState) {
-    Image const image = Image::Pattern(5, 4);
+    Picture const image = MakePattern(5, 4);
     TexturePtr const source = MakeTexture(image);
-    auto const [texture, target] = MakeOffscreen(Image(7, 3, kGreen));
+    auto const [texture, target] = MakeOffscreen(MakeImage(7, 3, kGreen));
     DepthStencilPtr const buffer = MakeDepthStencil(7, 3);
     target->AttachDepthStencil(buffer.get());
     ObstructDrawing();
@@ -135,7 +136,7 @@ TEST_P(TextureCopyTest, ATextureDrawsItselfTexelForTexelThroughAnyState) {
     target->Deactivate(false, false);
     RendererFactory::Flush();
     ExpectStillObstructed();
-    EXPECT_EQ(Read(*texture), Image(7, 3, kGreen).With(0, 0, image, 0, 0, 5, 3));
+    EXPECT_EQ(Read(*texture), MakeImage(7, 3, kGreen).With(0, 0, image.Crop(0, 0, 5, 3)));
     EXPECT_EQ(Read(*source), image);
 }
 
@@ -144,19 +145,19 @@ TEST_P(TextureCopyTest, ATextureDrawsItselfIntoTheLowerLeftOfTheDefaultFrameBuff
     constexpr int kHeight = kSurfaceHeight;
     TargetPtr const target(RendererFactory::CreateRenderTargetFromDefault(kWidth, kHeight));
     Clear(*target, kBlue);
-    TexturePtr const source = MakeTexture(Image::Pattern(8, 8));
+    TexturePtr const source = MakeTexture(MakePattern(8, 8));
     target->Activate();
     source->DrawToCurrent();
     TexturePtr const copy = MakeTexture(kWidth, kHeight);
     copy->CopyFromRenderTarget();
     target->Deactivate(false, false);
-    Image const expected = Image(kWidth, kHeight, kBlue).With(0, 0, Image::Pattern(8, 8), 0, 0, 8, 8);
+    Picture const expected = MakeImage(kWidth, kHeight, kBlue).With(0, 0, MakePattern(8, 8));
     EXPECT_EQ(Read(*target, kWidth, kHeight), expected);
     EXPECT_EQ(Read(*copy), expected);
 }
 
 TEST_P(TextureCopyTest, ATextureOverTheActiveTargetsStorageCopiesNothing) {
-    Image const image = Image::Pattern(5, 4);
+    Picture const image = MakePattern(5, 4);
     auto const [texture, target] = MakeOffscreen(image);
     TexturePtr const view = MakeView(*texture);
     target->Activate();

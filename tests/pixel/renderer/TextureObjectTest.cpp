@@ -14,14 +14,14 @@ namespace {
 class TextureObjectTest : public RendererFixture {
 protected:
     // What a texture bound to unit 0 shows at a texture coordinate, through a shader.
-    static Pixel Sample(ITextureObject& texture, float s, float t) {
+    static Color Sample(ITextureObject& texture, float s, float t) {
         HostFrameBuffer const frameBuffer(1, 1);
         std::string const coordinate = std::to_string(s) + ", " + std::to_string(t);
         RawQuad const quad(("color = texture(texel, vec2(" + coordinate + "));").c_str());
         glViewport(0, 0, 1, 1);
         texture.Bind(0);
         quad.Draw();
-        return frameBuffer.Read().At(0, 0);
+        return frameBuffer.Read().GetColor(0, 0);
     }
 
     static GLuint NameBoundBy(ITextureObject& texture) {
@@ -32,15 +32,14 @@ protected:
 };
 
 // Two columns and two rows, all different.
-Image Corners() {
-    Image image(2, 2);
-    image.pixels = {kRed, kGreen, kBlue, kClear};
-    return image;
+Picture Corners() {
+    Picture const red = MakeImage(1, 1, kRed), green = MakeImage(1, 1, kGreen), blue = MakeImage(1, 1, kBlue);
+    return MakeImage(2, 2, kClear).With(0, 0, red).With(1, 0, green).With(0, 1, blue);
 }
 
 TEST_F(TextureObjectTest, StorageIsSharedAndLivesUntilItsLastOwnerGoesInAnyOrder) {
     for (int first = 0; first < 3; ++first) {
-        TexturePtr model = MakeTexture(Image(2, 2, kGreen));
+        TexturePtr model = MakeTexture(MakeImage(2, 2, kGreen));
         TexturePtr view = MakeView(*model);
         TargetPtr target = MakeTarget(*model);
         target->Activate();
@@ -85,9 +84,9 @@ TEST_F(TextureObjectTest, SamplingIsLinearAndClampedUntilSaidOtherwise) {
     EXPECT_EQ(Sample(*texture, -3.0f, 0.25f), kRed);
     EXPECT_EQ(Sample(*texture, 4.0f, 0.25f), kGreen);
     EXPECT_EQ(Sample(*texture, 0.25f, 0.75f), kBlue); // row 0 is at the top of texture space
-    Pixel const middle = Sample(*texture, 0.5f, 0.25f);
-    EXPECT_NEAR(middle.r, 128, 1);
-    EXPECT_NEAR(middle.g, 128, 1);
+    Color const middle = Sample(*texture, 0.5f, 0.25f);
+    EXPECT_NEAR(middle[0], 128, 1);
+    EXPECT_NEAR(middle[1], 128, 1);
 
     constexpr int kRefused[][2] = {{TextureParamWrappingS, 2},
                                    {TextureParamWrappingT, 4},
@@ -187,7 +186,7 @@ TEST_F(TextureObjectTest, WhatTheDeviceCannotHoldOrDoesNotKnowIsRefusedWithOneLi
     auto const make = [](TextureDescriptor const& descriptor, PixelSource const& source = {}) {
         return TexturePtr(RendererFactory::CreateTextureObject(descriptor, nullptr, 0, source));
     };
-    Image const image(4, 4);
+    Picture const image = MakeImage(4, 4);
     EXPECT_FALSE(make({4, 4, 1, 2, 6, 1, false, nullptr}));
     EXPECT_FALSE(make({4, 4, 0, 3, 6, 1, false, nullptr}));
     EXPECT_FALSE(make({4, 4, 0, 2, 7, 1, false, nullptr}));

@@ -11,7 +11,7 @@ namespace {
 
 class TextureTransferTest : public RendererFixture {};
 
-// Pixel-store values that would ruin any transfer that trusts in the defaults.
+// Color-store values that would ruin any transfer that trusts in the defaults.
 void LeavePixelStoreDirty(GLuint buffer) {
     for (int const name : {GL_UNPACK_ROW_LENGTH, GL_UNPACK_SKIP_ROWS, GL_UNPACK_SKIP_PIXELS,
                            GL_PACK_ROW_LENGTH, GL_PACK_SKIP_ROWS, GL_PACK_SKIP_PIXELS}) {
@@ -34,14 +34,14 @@ void ExpectDefaultPixelStore() {
 }
 
 TEST_F(TextureTransferTest, TheFirstRowUploadedIsGlRowZeroAndComesBackFirst) {
-    Image const image = Image::Pattern(5, 3);
+    Picture const image = MakePattern(5, 3);
     auto const [texture, target] = MakeOffscreen(image);
     EXPECT_EQ(Read(*texture), image);
     // Seen by GL itself, without the renderer's own read-back.
     target->Activate();
-    Pixel first;
-    glReadPixels(1, 0, 1, 1, GL_RGBA, GL_UNSIGNED_BYTE, &first);
-    EXPECT_EQ(first, image.At(1, 0));
+    Color first;
+    glReadPixels(1, 0, 1, 1, GL_RGBA, GL_UNSIGNED_BYTE, first.data());
+    EXPECT_EQ(first, image.GetColor(1, 0));
 }
 
 TEST_F(TextureTransferTest, ANewTextureWithoutPixelsIsTransparentWhateverForeignCodeLeft) {
@@ -49,24 +49,24 @@ TEST_F(TextureTransferTest, ANewTextureWithoutPixelsIsTransparentWhateverForeign
     glScissor(2, 2, 1, 1);
     glColorMask(GL_FALSE, GL_TRUE, GL_FALSE, GL_TRUE);
     // Freed memory is what a driver hands out again, so it is filled with something to be seen.
-    { TexturePtr const old = MakeTexture(Image(64, 64, kRed)); }
+    { TexturePtr const old = MakeTexture(MakeImage(64, 64, kRed)); }
     TexturePtr const texture = MakeTexture(64, 64);
-    EXPECT_EQ(Read(*texture), Image(64, 64, kClear));
+    EXPECT_EQ(Read(*texture), MakeImage(64, 64, kClear));
     EXPECT_TRUE(glIsEnabled(GL_SCISSOR_TEST));
     EXPECT_EQ(GetColorMask(), (ColorMask{0, 1, 0, 1}));
 }
 
 TEST_F(TextureTransferTest, ABlockIsUploadedOutOfALargerImage) {
-    Image const whole = Image::Pattern(300, 50);
+    Picture const whole = MakePattern(300, 50);
     TexturePtr const texture(RendererFactory::CreateTextureObject(
         {183, 18, 0, 2, 6, 1, true, nullptr}, nullptr, 0, {whole.pixels.data(), 17, 32, whole.width}));
-    EXPECT_EQ(Read(*texture), Image(183, 18).With(0, 0, whole, 17, 32, 183, 18));
+    EXPECT_EQ(Read(*texture), MakeImage(183, 18).With(0, 0, whole.Crop(17, 32, 183, 18)));
     EXPECT_EQ(RendererFactory::GetStatistics().bytesUploaded, 183u * 18 * 4);
 }
 
 TEST_F(TextureTransferTest, UploadsOutsideTheTextureAreClippedAndTheRestLandsInItsPlace) {
-    Image const base = Image(8, 6, kGreen);
-    Image const source = Image::Pattern(5, 4);
+    Picture const base = MakeImage(8, 6, kGreen);
+    Picture const source = MakePattern(5, 4);
     constexpr int kMin = std::numeric_limits<int>::min();
     constexpr int kMax = std::numeric_limits<int>::max();
     struct {
@@ -93,48 +93,47 @@ TEST_F(TextureTransferTest, UploadsOutsideTheTextureAreClippedAndTheRestLandsInI
         std::uint64_t const before = RendererFactory::GetStatistics().bytesUploaded;
         texture->Replace(rect, source.pixels.data(), 0);
         EXPECT_EQ(RendererFactory::GetStatistics().bytesUploaded - before, std::uint64_t(4 * w * h));
-        Image const expected =
-            w > 0 ? base.With(rect.left + left, rect.top + top, source, left, top, w, h) : base;
-        EXPECT_EQ(Read(*texture), expected);
+        Picture const part = source.Crop(left, top, w, h);
+        EXPECT_EQ(Read(*texture), w > 0 ? base.With(rect.left + left, rect.top + top, part) : base);
     }
     texture->Replace(nullptr, 0);
     EXPECT_EQ(Read(*texture), base);
 }
 
 TEST_F(TextureTransferTest, EveryStrideIsInBytes) {
-    Image const image = Image::Pattern(7, 5);
+    Picture const image = MakePattern(7, 5);
     for (int stride : {28, 32, 29, 30, 43, 400}) {
         auto const step = static_cast<std::size_t>(stride);
         std::vector<unsigned char> memory(step * 5, 0xAB);
-        for (std::size_t y = 0; y < 5; ++y) std::memcpy(&memory[y * step], &image.pixels[y * 7], 28);
+        for (std::size_t y = 0; y < 5; ++y) std::memcpy(&memory[y * step], &image.pixels[y * 28], 28);
         TexturePtr const texture = MakeTexture(7, 5);
         texture->Replace(memory.data(), stride);
         EXPECT_EQ(Read(*texture), image) << stride;
 
         // Clipped at the left and at the top, where the source has to be advanced by rows of that stride.
-        TexturePtr const clipped = MakeTexture(Image(7, 5, kRed));
+        TexturePtr const clipped = MakeTexture(MakeImage(7, 5, kRed));
         clipped->Replace(Rect(-2, -1, 5, 4), memory.data(), stride);
-        EXPECT_EQ(Read(*clipped), Image(7, 5, kRed).With(0, 0, image, 2, 1, 5, 4)) << stride;
+        EXPECT_EQ(Read(*clipped), MakeImage(7, 5, kRed).With(0, 0, image.Crop(2, 1, 5, 4))) << stride;
     }
 }
 
 TEST_F(TextureTransferTest, RowsThatWouldOverlapAreRefusedWithALine) {
-    auto const [texture, target] = MakeOffscreen(Image(7, 5, kRed));
-    std::vector<Pixel> const pixels(35, kBlue);
+    auto const [texture, target] = MakeOffscreen(MakeImage(7, 5, kRed));
+    std::vector<Color> const pixels(35, kBlue);
     texture->Replace(pixels.data(), 7);
-    EXPECT_EQ(Read(*texture), Image(7, 5, kRed));
-    Image destination(7, 5);
+    EXPECT_EQ(Read(*texture), MakeImage(7, 5, kRed));
+    Picture destination = MakeImage(7, 5);
     target->ReadPixels(0, 0, 7, 5, {destination.pixels.data(), 6, 0, 0});
     target->ReadPixels(0, 0, 1, 1, {destination.pixels.data(), 7, -1, 0});
     target->ReadPixels(0, 0, 7, 5, {nullptr, 7, 0, 0}); // quietly
-    EXPECT_EQ(destination, Image(7, 5));
+    EXPECT_EQ(destination, MakeImage(7, 5));
     std::vector<std::string> const errors = TakeErrors();
     ASSERT_EQ(errors.size(), 3u);
     EXPECT_NE(errors[0].find("28 bytes lie 7 bytes apart"), std::string::npos) << errors[0];
 }
 
 TEST_F(TextureTransferTest, ReadBackTouchesNothingButThePixelsInsideTheTarget) {
-    Image const image = Image::Pattern(8, 6);
+    Picture const image = MakePattern(8, 6);
     auto const [texture, target] = MakeOffscreen(image);
     struct {
         int x, y, w, h;               // the block asked for
@@ -146,10 +145,11 @@ TEST_F(TextureTransferTest, ReadBackTouchesNothingButThePixelsInsideTheTarget) {
     };
     for (auto const& c : cases) {
         // The block lies two rows down and three pixels in, in rows of fifteen.
-        Image destination(15, 14);
+        Picture destination = MakeImage(15, 14);
         target->ReadPixels(c.x, c.y, c.w, c.h, {destination.pixels.data(), 15, 2, 3});
-        EXPECT_EQ(destination, Image(15, 14).With(3 + c.left, 2 + c.top, image, c.x + c.left, c.y + c.top,
-                                                  c.width, c.height))
+        EXPECT_EQ(destination,
+                  MakeImage(15, 14).With(3 + c.left, 2 + c.top,
+                                         image.Crop(c.x + c.left, c.y + c.top, c.width, c.height)))
             << c.x << ' ' << c.y << ' ' << c.w << ' ' << c.h;
     }
 }
@@ -165,13 +165,13 @@ TEST_F(TextureTransferTest, PixelStoreAndTextureBindingsLeakNeitherInNorOut) {
     glBufferData(GL_PIXEL_UNPACK_BUFFER, 4096, nullptr, GL_STREAM_DRAW);
 
     LeavePixelStoreDirty(buffer);
-    Image const image = Image::Pattern(9, 7);
+    Picture const image = MakePattern(9, 7);
     TexturePtr const texture = MakeTexture(image);
     LeavePixelStoreDirty(buffer);
-    texture->Replace(Rect(1, 1, 4, 3), Image(3, 2, kRed).pixels.data(), 0);
+    texture->Replace(Rect(1, 1, 4, 3), MakeImage(3, 2, kRed).pixels.data(), 0);
     LeavePixelStoreDirty(buffer);
-    Image const all = Read(*texture);
-    EXPECT_EQ(all, image.With(1, 1, Image(3, 2, kRed), 0, 0, 3, 2));
+    Picture const all = Read(*texture);
+    EXPECT_EQ(all, image.With(1, 1, MakeImage(3, 2, kRed)));
     EXPECT_EQ(GetInteger(GL_ACTIVE_TEXTURE), GL_TEXTURE3);
     EXPECT_EQ(GetInteger(GL_TEXTURE_BINDING_2D), static_cast<GLint>(foreign));
 

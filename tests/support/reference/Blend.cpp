@@ -73,14 +73,13 @@ Rgba RoundedToBytes(Rgba const& c) { return FromBytes(ToBytes(c)); }
 Rgba Clamped(Rgba const& c) { return {Clamp01(c.r), Clamp01(c.g), Clamp01(c.b), Clamp01(c.a)}; }
 
 Rgba PaintColor(MKPaint const& paint, double coverage) {
-    auto color = paint.GetColor();
-    double alpha = coverage * static_cast<double>(color.w);
+    Rgba color(paint.GetColor());
+    double alpha = coverage * color.a;
     if (paint.HasTintColor()) {
-        color = paint.GetTintColor();
-        alpha *= static_cast<double>(color.w);
+        color = Rgba(paint.GetTintColor());
+        alpha *= color.a;
     }
-    return {static_cast<double>(color.x) * alpha, static_cast<double>(color.y) * alpha,
-            static_cast<double>(color.z) * alpha, alpha};
+    return {color.r * alpha, color.g * alpha, color.b * alpha, alpha};
 }
 
 Rgba Blend(int mode, Rgba const& source, Rgba const& destination) {

@@ -7,6 +7,10 @@
 namespace Moka::Testing {
 
 struct Rgba {
+    Rgba() = default;
+    Rgba(double red, double green, double blue, double alpha) : r(red), g(green), b(blue), a(alpha) {}
+    explicit Rgba(Vector4<float> const& v) : r(double{v.x}), g(double{v.y}), b(double{v.z}), a(double{v.w}) {}
+
     double r = 0;
     double g = 0;
     double b = 0;

@@ -48,11 +48,6 @@ bool Combine(IMKCanvasBase::ClipOp op, bool area, bool rect) {
     return area;
 }
 
-bool HoldsPoint(RectF const& r, PointD const& p) {
-    return p.x >= static_cast<double>(r.left) && p.x < static_cast<double>(r.right) &&
-           p.y >= static_cast<double>(r.top) && p.y < static_cast<double>(r.bottom);
-}
-
 } // namespace
 
 ClipSet::ClipSet(std::vector<ClipEntry> const& entries, int targetHeight) {
@@ -92,7 +87,7 @@ bool ClipSet::Contains(int pixelX, int pixelY, PointD const& point) const {
     bool area = mStartsFull;
     for (Region const& region : mRegions) {
         auto const local = region.transform.Unmap(point);
-        area = Combine(region.op, area, local && HoldsPoint(region.rect, *local));
+        area = Combine(region.op, area, local && RectD(region.rect).Holds(*local));
     }
     return area;
 }

@@ -9,9 +9,7 @@ namespace {
 bool IsMirrored(RectF const& r) { return r.right < r.left || r.bottom < r.top; }
 bool IsMirroredOnce(RectF const& r) { return (r.right < r.left) != (r.bottom < r.top); }
 
-double LargestInset(RectF const& r) {
-    return std::min(static_cast<double>(r.GetWidth()), static_cast<double>(r.GetHeight())) / 2;
-}
+double LargestInset(RectF const& r) { return std::min(double{r.GetWidth()}, double{r.GetHeight()}) / 2; }
 
 // Of a ring between two insets, and all inside it: the rectangle is too narrow for the inner one, so that the
 // ring's sides cross each other.
@@ -36,9 +34,9 @@ Coverage HardStroke(RectF const& r, double h, double inset) {
 
 } // namespace
 
-double InsetIn(RectF const& r, PointD const& p) {
-    return std::min({p.x - static_cast<double>(r.left), static_cast<double>(r.right) - p.x,
-                     p.y - static_cast<double>(r.top), static_cast<double>(r.bottom) - p.y});
+double InsetIn(RectF const& rect, PointD const& p) {
+    RectD const r(rect);
+    return std::min({p.x - r.left, r.right - p.x, p.y - r.top, r.bottom - p.y});
 }
 
 RectF Grown(RectF const& r, double by) {

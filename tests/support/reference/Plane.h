@@ -10,8 +10,23 @@
 namespace Moka::Testing {
 
 struct PointD {
+    PointD() = default;
+    PointD(double px, double py) : x(px), y(py) {}
+    PointD(PointF const& p) : x(double{p.x}), y(double{p.y}) {}
+
     double x = 0;
     double y = 0;
+};
+
+struct RectD {
+    explicit RectD(RectF const& r)
+        : left(double{r.left}), top(double{r.top}), right(double{r.right}), bottom(double{r.bottom}) {}
+
+    double GetWidth() const { return right - left; }
+    double GetHeight() const { return bottom - top; }
+    bool Holds(PointD const& p) const { return p.x >= left && p.x < right && p.y >= top && p.y < bottom; }
+
+    double left, top, right, bottom;
 };
 
 class Transform {

@@ -11,10 +11,10 @@ namespace Moka::Testing {
 
 class ReferenceBitmap final : public MKBitmap {
 public:
-    explicit ReferenceBitmap(TestImage const& pixels)
+    explicit ReferenceBitmap(Picture const& pixels)
         : MKBitmap(nullptr, 0, 0, pixels.width, pixels.height), image(pixels) {}
 
-    TestImage image;
+    Picture image;
     Sampler sampler; // as the last drawing of it left it
 
     IMKBitmap* Clone() override { return new (std::nothrow) ReferenceBitmap(image); }

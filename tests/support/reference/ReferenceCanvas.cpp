@@ -10,14 +10,12 @@
 namespace Moka::Testing {
 namespace {
 
-MKPaint Given(MKPaint const* paint) { return paint ? *paint : MKPaint(); }
 bool Fills(MKPaint const& p) {
     return p.GetStyle() == MKPaint::Fill || p.GetStyle() == MKPaint::FillAndStroke;
 }
 bool Strokes(MKPaint const& p) {
     return p.GetStyle() == MKPaint::Stroke || p.GetStyle() == MKPaint::FillAndStroke;
 }
-PointD ToPoint(PointF const& p) { return {static_cast<double>(p.x), static_cast<double>(p.y)}; }
 bool IsFlat(RectF const& r) { return r.left == r.right || r.top == r.bottom; }
 
 RectF BoxAround(PointF const* points, std::size_t count) {
@@ -32,31 +30,6 @@ ReferenceCanvas::ReferenceCanvas(ReferenceBitmap& target, Device const& device)
     : mTarget(target),
       mStripHeight(device.maxTextureSize),
       mRaster(target.image, device.maxTextureSize, device.subpixelBits) {}
-
-void ReferenceCanvas::Clear(int argb) {
-    MKPaint unpacked;
-    unpacked.SetColor(argb);
-    auto const c = unpacked.GetColor();
-    Clear(c.x, c.y, c.z, c.w);
-}
-
-void ReferenceCanvas::Clear(float r, float g, float b, float a) {
-    mRaster.Fill(
-        {static_cast<double>(r), static_cast<double>(g), static_cast<double>(b), static_cast<double>(a)},
-        GetClip());
-}
-
-void ReferenceCanvas::ClearAll(int argb) {
-    MKPaint unpacked;
-    unpacked.SetColor(argb);
-    auto const c = unpacked.GetColor();
-    ClearAll(c.x, c.y, c.z, c.w);
-}
-
-void ReferenceCanvas::ClearAll(float r, float g, float b, float a) {
-    mRaster.FillAll(
-        {static_cast<double>(r), static_cast<double>(g), static_cast<double>(b), static_cast<double>(a)});
-}
 
 // What is not saved counts as saved where it was saved last, or as new; so restoring resets it.
 int ReferenceCanvas::Save(SaveFlag flag) {
@@ -101,42 +74,23 @@ void ReferenceCanvas::DrawShapes(std::vector<Shape> const& shapes, RectF const& 
     mRaster.Draw(painting, GetClip());
 }
 
-void ReferenceCanvas::DrawLine(float x1, float y1, float x2, float y2, MKPaint const* paint) {
-    DrawLine(PointF(x1, y1), PointF(x2, y2), paint);
-}
-
 void ReferenceCanvas::DrawLine(PointF const& from, PointF const& to, MKPaint const* given) {
     MKPaint const paint = Given(given);
     if (from == to || paint.GetLineWidth() < 1) return;
     PointF const ends[] = {from, to};
-    DrawShapes({Line(ToPoint(from), ToPoint(to), paint)}, BoxAround(ends, 2), paint);
-}
-
-void ReferenceCanvas::DrawSimpleLine(float x1, float y1, float x2, float y2, MKPaint const* paint) {
-    DrawSimpleLine(PointF(x1, y1), PointF(x2, y2), paint);
-}
-
-void ReferenceCanvas::DrawSimpleLine(PointF const& from, PointF const& to, MKPaint const* given) {
-    if (!(from == to)) DrawSegments({from, to}, Given(given));
-}
-
-void ReferenceCanvas::DrawSimpleLines(std::vector<PointF> const& points, MKPaint const* given) {
-    if (!points.empty()) DrawSegments(points, Given(given));
+    DrawShapes({Line(from, to, paint)}, BoxAround(ends, 2), paint);
 }
 
 // One by one: no segment meets its neighbour without a seam.
-void ReferenceCanvas::DrawSegments(std::vector<PointF> const& points, MKPaint const& paint) {
-    if (paint.GetLineWidth() < 1) return;
+void ReferenceCanvas::DrawSimpleLines(std::vector<PointF> const& points, MKPaint const* given) {
+    MKPaint const paint = Given(given);
+    if (points.empty() || paint.GetLineWidth() < 1) return;
     RectF const extent = BoxAround(points.data(), points.size());
     for (std::size_t i = 0; i + 1 < points.size(); i += 2) {
-        DrawShapes({SimpleLine(ToPoint(points[i]), ToPoint(points[i + 1]),
-                               static_cast<double>(paint.GetLineWidth()), paint.IsAntiAliasing())},
-                   extent, paint);
+        DrawShapes(
+            {SimpleLine(points[i], points[i + 1], double{paint.GetLineWidth()}, paint.IsAntiAliasing())},
+            extent, paint);
     }
-}
-
-void ReferenceCanvas::DrawRect(float left, float top, float right, float bottom, MKPaint const* paint) {
-    DrawRect(RectF(left, top, right, bottom), paint);
 }
 
 void ReferenceCanvas::DrawRect(RectF const& rect, MKPaint const* given) {
@@ -149,11 +103,6 @@ void ReferenceCanvas::DrawRect(RectF const& rect, MKPaint const* given) {
             StrokedRect(rect, static_cast<double>(paint.GetLineWidth()), paint.IsAntiAliasing()));
     }
     DrawShapes(shapes, rect, paint);
-}
-
-void ReferenceCanvas::DrawRoundRect(float left, float top, float right, float bottom, float rx, float ry,
-                                    MKPaint const* paint) {
-    DrawRoundRect(RectF(left, top, right, bottom), rx, ry, paint);
 }
 
 void ReferenceCanvas::DrawRoundRect(RectF const& rect, float rx, float ry, MKPaint const* given) {

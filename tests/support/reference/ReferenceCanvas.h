@@ -25,10 +25,10 @@ public:
 
     Slack const& GetSlack() const { return mRaster.GetSlack(); }
 
-    void Clear(int argb) override;
-    void Clear(float r, float g, float b, float a) override;
-    void ClearAll(int argb) override;
-    void ClearAll(float r, float g, float b, float a) override;
+    void Clear(int argb) override { mRaster.Fill(Unpack(argb), GetClip()); }
+    void Clear(float r, float g, float b, float a) override { mRaster.Fill({r, g, b, a}, GetClip()); }
+    void ClearAll(int argb) override { mRaster.FillAll(Unpack(argb)); }
+    void ClearAll(float r, float g, float b, float a) override { mRaster.FillAll({r, g, b, a}); }
 
     int Save(SaveFlag flag) override;
     void Restore(int level) override;
@@ -55,15 +55,25 @@ public:
     int Unref() override { return RefCount::Unref(); }
 
     void Draw(IMKCustomDrawable*, MKPaint const*) override {}
-    void DrawLine(float x1, float y1, float x2, float y2, MKPaint const* paint) override;
+    void DrawLine(float x1, float y1, float x2, float y2, MKPaint const* paint) override {
+        DrawLine(PointF(x1, y1), PointF(x2, y2), paint);
+    }
     void DrawLine(PointF const& from, PointF const& to, MKPaint const* paint) override;
-    void DrawSimpleLine(float x1, float y1, float x2, float y2, MKPaint const* paint) override;
-    void DrawSimpleLine(PointF const& from, PointF const& to, MKPaint const* paint) override;
+    void DrawSimpleLine(float x1, float y1, float x2, float y2, MKPaint const* paint) override {
+        DrawSimpleLine(PointF(x1, y1), PointF(x2, y2), paint);
+    }
+    void DrawSimpleLine(PointF const& from, PointF const& to, MKPaint const* paint) override {
+        if (!(from == to)) DrawSimpleLines({from, to}, paint);
+    }
     void DrawSimpleLines(std::vector<PointF> const& points, MKPaint const* paint) override;
-    void DrawRect(float left, float top, float right, float bottom, MKPaint const* paint) override;
+    void DrawRect(float left, float top, float right, float bottom, MKPaint const* paint) override {
+        DrawRect(RectF(left, top, right, bottom), paint);
+    }
     void DrawRect(RectF const& rect, MKPaint const* paint) override;
     void DrawRoundRect(float left, float top, float right, float bottom, float rx, float ry,
-                       MKPaint const* paint) override;
+                       MKPaint const* paint) override {
+        DrawRoundRect(RectF(left, top, right, bottom), rx, ry, paint);
+    }
     void DrawRoundRect(RectF const& rect, float rx, float ry, MKPaint const* paint) override;
     void DrawCircle(float cx, float cy, float radius, MKPaint const* paint) override;
     void DrawBitmap(IMKBitmap* bitmap, float x, float y, MKPaint const* paint) override;
@@ -80,12 +90,17 @@ private:
         int clips = 0;
     };
 
+    static MKPaint Given(MKPaint const* paint) { return paint ? *paint : MKPaint(); }
+    static Rgba Unpack(int argb) {
+        MKPaint paint;
+        paint.SetColor(argb);
+        return Rgba(paint.GetColor());
+    }
     ClipSet GetClip() const { return ClipSet(mClips, mTarget.image.height); }
     void DrawShapes(std::vector<Shape> const& shapes, RectF const& extent, MKPaint const& paint,
                     bool arePieces = false);
-    void DrawSegments(std::vector<PointF> const& points, MKPaint const& paint);
-    void DrawQuads(TestImage const& image, ReferenceBitmap const& bitmap,
-                   std::vector<BitmapQuad> const& quads, MKPaint const& paint, bool batch);
+    void DrawQuads(Picture const& image, ReferenceBitmap const& bitmap, std::vector<BitmapQuad> const& quads,
+                   MKPaint const& paint, bool batch);
 
     ReferenceBitmap& mTarget;
     int const mStripHeight;

@@ -6,12 +6,10 @@
 namespace Moka::Testing {
 namespace {
 
-MKPaint Given(MKPaint const* paint) { return paint ? *paint : MKPaint(); }
-
 // Bitmaps of other kinds have their pixels where the reference cannot reach them.
 ReferenceBitmap* Find(IMKBitmap* bitmap) { return dynamic_cast<ReferenceBitmap*>(bitmap); }
 
-// Right and bottom are the size, wherever the bitmap lies; relied upon.
+// Right and bottom are the size, wherever the bitmap lies, which callers see.
 RectF WholeOf(IMKBitmap const& bitmap) {
     return {static_cast<float>(bitmap.GetX()), static_cast<float>(bitmap.GetY()),
             static_cast<float>(bitmap.GetWidth()), static_cast<float>(bitmap.GetHeight())};
@@ -39,7 +37,7 @@ BitmapQuad MakeQuad(RectF const& bounds, RectF const& src, RectF const& dst, boo
     auto const width = static_cast<double>(bounds.GetWidth());
     auto const height = static_cast<double>(bounds.GetHeight());
     auto const part = [](float value, double size) { return static_cast<double>(value) / size; };
-    // The right edge adds where the left one subtracts; relied upon.
+    // The right edge adds where the left one subtracts, which callers see.
     return {dst,
             part(src.left - bounds.left, width),
             part(src.top - bounds.top, height),
@@ -53,8 +51,7 @@ constexpr double kStep = 1.0 / 128;
 constexpr double kFiltering = 1;
 
 // The image and the paint outlive the brush.
-Brush MakeBrush(TestImage const& image, Sampler const& sampler, BitmapQuad const& quad,
-                MKPaint const& paint) {
+Brush MakeBrush(Picture const& image, Sampler const& sampler, BitmapQuad const& quad, MKPaint const& paint) {
     Shape const shape = quad.GetShape();
     double const columns = (quad.rightU - quad.leftU) * image.width;
     double const rows = (quad.bottomV - quad.topV) * image.height;
@@ -108,10 +105,10 @@ void ReferenceCanvas::DrawBitmap(IMKBitmap* given, RectF const& src, RectF const
     if (!tiles) paint.SetTileMode(MKPaint::Clamp);
     SetTiling(bitmap->sampler.x, paint.GetTileModeX());
     SetTiling(bitmap->sampler.y, paint.GetTileModeY());
-    TestImage const whole = bitmap->image; // the target may be drawn onto itself
+    Picture const whole = bitmap->image; // the target may be drawn onto itself
     for (int top = 0; top < whole.height; top += mStripHeight) {
         int const rows = std::min(mStripHeight, whole.height - top);
-        TestImage const strip = whole.Crop(0, top, whole.width, rows);
+        Picture const strip = whole.Crop(0, top, whole.width, rows);
         RectF bounds(Rect(0, top, whole.width, top + rows));
         RectF from(std::max(bounds.left, src.left), std::max(bounds.top, src.top),
                    std::min(bounds.right, src.right), std::min(bounds.bottom, src.bottom));
@@ -131,7 +128,7 @@ void ReferenceCanvas::DrawBitmap(IMKBitmap* given, RectF const& src, RectF const
     }
 }
 
-void ReferenceCanvas::DrawQuads(TestImage const& image, ReferenceBitmap const& bitmap,
+void ReferenceCanvas::DrawQuads(Picture const& image, ReferenceBitmap const& bitmap,
                                 std::vector<BitmapQuad> const& quads, MKPaint const& paint, bool batch) {
     Painting painting;
     painting.matrix = mMatrix;
@@ -168,7 +165,7 @@ void ReferenceCanvas::DrawBitmaps(IMKBitmap* given, RectF const& src, std::vecto
     MKPaint const paint = Given(givenPaint);
     SetTiling(bitmap->sampler.x, paint.GetTileModeX());
     SetTiling(bitmap->sampler.y, paint.GetTileModeY());
-    TestImage const first =
+    Picture const first =
         bitmap->image.Crop(0, 0, bitmap->image.width, std::min(mStripHeight, bitmap->image.height));
     std::vector<BitmapQuad> quads;
     for (RectF const& dst : dsts) {

@@ -31,9 +31,8 @@ Rgba Nudged(Rgba const& c) {
 }
 
 std::optional<Ink> Touch(Brush const& brush, PointD const& p) {
-    RectF const& r = brush.bounds;
-    bool const inside = p.x >= static_cast<double>(r.left) && p.x <= static_cast<double>(r.right) &&
-                        p.y >= static_cast<double>(r.top) && p.y <= static_cast<double>(r.bottom);
+    RectD const r(brush.bounds);
+    bool const inside = p.x >= r.left && p.x <= r.right && p.y >= r.top && p.y <= r.bottom;
     return inside ? brush.at(p) : std::nullopt;
 }
 

@@ -41,7 +41,7 @@ bool Meets(RectF const& frame, RectF const& shape, Matrix3f const& m) {
     return frame.IsIntersect(*box);
 }
 
-ReferenceRaster::ReferenceRaster(TestImage& image, int stripHeight, int subpixelBits)
+ReferenceRaster::ReferenceRaster(Picture& image, int stripHeight, int subpixelBits)
     : mImage(image),
       mStripHeight(stripHeight),
       mSubpixelBits(subpixelBits),

@@ -14,7 +14,7 @@ bool Meets(RectF const& frame, RectF const& shape, Matrix3f const& m);
 class ReferenceRaster {
 public:
     // The image, which outlives it, is cut into strips of so many rows.
-    ReferenceRaster(TestImage& image, int stripHeight, int subpixelBits);
+    ReferenceRaster(Picture& image, int stripHeight, int subpixelBits);
 
     void Draw(Painting const& painting, ClipSet const& clip);
     void Fill(Rgba const& color, ClipSet const& clip);
@@ -26,7 +26,7 @@ private:
     void DrawStrip(ReferenceDraw const& draw, std::vector<Brush> const& brushes, Rect const& strip);
     void DrawPixel(ReferenceDraw const& draw, int x, int y, ReferenceDraw::Brushes const& brushes);
 
-    TestImage& mImage;
+    Picture& mImage;
     int const mStripHeight;
     int const mSubpixelBits;
     Slack mSlack;

@@ -9,11 +9,7 @@ namespace Moka::Testing {
 
 class ReferenceStage final : public Scenes::SceneStage {
 public:
-    IMKBitmap* MakeBitmap(Scenes::Picture const& picture) override {
-        TestImage image(picture.width, picture.height);
-        image.pixels = picture.pixels;
-        return new ReferenceBitmap(image);
-    }
+    IMKBitmap* MakeBitmap(Scenes::Picture const& picture) override { return new ReferenceBitmap(picture); }
     IGLMsgQueue* GetQueue() override { return nullptr; }
 };
 

@@ -83,24 +83,6 @@ TEST(ReferenceCoverage, LinesEndInTheirCapsAndDashes) {
     EXPECT_DOUBLE_EQ(at(10.25, 0), 0.25); // the line ends with a dash
 }
 
-TEST(ReferenceSlack, AllowsEachPixelItsOwn) {
-    TestImage const a(4, 4);
-    TestImage b = a;
-    b.SetColor(1, 0, {0, 0, 9, 0});
-    b.SetColor(2, 3, {3, 0, 0, 5});
-    Slack slack(4, 4);
-    slack.Set(1, 0, 9);
-    slack.Set(2, 3, 4);
-    ImageDifference const difference = CompareImages(a, b, &slack);
-    EXPECT_EQ(difference.differingPixels, 1);
-    EXPECT_EQ(difference.largest, 5);
-    EXPECT_EQ(difference.firstX, 2);
-    EXPECT_EQ(difference.firstY, 3);
-    slack.Set(2, 3, 300);
-    EXPECT_EQ(CompareImages(a, b, &slack).differingPixels, 0);
-    EXPECT_EQ(slack.CountOver(8), 2);
-}
-
 TEST(ReferenceBlend, FollowsTheEquationsOnBytes) {
     Rgba const s{0.4, 0.22, 0, 0.5};
     Rgba const d{0.1, 0.6, 0.3, 0.75};
@@ -130,7 +112,7 @@ TEST(ReferenceClipSet, CutsStraightClipsTowardsZeroAndOthersAtPixelCentres) {
 }
 
 TEST(ReferenceCanvas, AllowsOneStepAndMoreOnlyWhereThePictureJumpsAtAPixelsCentre) {
-    ReferenceBitmap bitmap(TestImage(20, 20));
+    ReferenceBitmap bitmap(Picture(20, 20));
     ReferenceCanvas canvas(bitmap, {});
     Slack const& slack = canvas.GetSlack();
     MKPaint paint;

@@ -8,22 +8,19 @@ namespace {
 
 // The rectangle with its corner boxes, as lines across it.
 struct Frame {
-    RectF outer;
+    Frame(RectF const& r, double xRadius, double yRadius)
+        : outer(r),
+          rx(std::min(double{r.GetWidth()} / 2, xRadius)),
+          ry(std::min(double{r.GetHeight()} / 2, yRadius)),
+          innerLeft(outer.left + rx),
+          innerTop(outer.top + ry),
+          innerRight(outer.right - rx),
+          innerBottom(outer.bottom - ry) {}
+
+    RectD outer;
     double rx, ry;
     double innerLeft, innerTop, innerRight, innerBottom;
 };
-
-Frame MakeFrame(RectF const& r, double rx, double ry) {
-    double const ex = std::min(static_cast<double>(r.GetWidth()) / 2, rx);
-    double const ey = std::min(static_cast<double>(r.GetHeight()) / 2, ry);
-    return {r,
-            ex,
-            ey,
-            static_cast<double>(r.left) + ex,
-            static_cast<double>(r.top) + ey,
-            static_cast<double>(r.right) - ex,
-            static_cast<double>(r.bottom) - ey};
-}
 
 RectF MakeRect(double l, double t, double r, double b) {
     return Sorted(
@@ -31,15 +28,10 @@ RectF MakeRect(double l, double t, double r, double b) {
 }
 
 // Half-open, so that of two pieces that meet exactly one has a point between them.
-bool Holds(RectF const& r, PointD const& p) {
-    return p.x >= static_cast<double>(r.left) && p.x < static_cast<double>(r.right) &&
-           p.y >= static_cast<double>(r.top) && p.y < static_cast<double>(r.bottom);
-}
-
 template <class Function>
 Shape Piece(RectF const& bounds, Function const& coverage) {
     return {bounds, [=](PointD const& p) -> Coverage {
-                if (!Holds(bounds, p)) return {};
+                if (!RectD(bounds).Holds(p)) return {};
                 return coverage(p);
             }};
 }
@@ -47,23 +39,21 @@ Shape Piece(RectF const& bounds, Function const& coverage) {
 // One straight side: profile gives the coverage at a distance inwards from the edge.
 template <class Function>
 void AddSides(std::vector<Shape>& shapes, Frame const& f, double from, double to, Function const& profile) {
-    RectF const& r = f.outer;
-    double const l = static_cast<double>(r.left), t = static_cast<double>(r.top);
-    double const right = static_cast<double>(r.right), b = static_cast<double>(r.bottom);
-    shapes.push_back(Piece(MakeRect(f.innerLeft, t + from, f.innerRight, t + to),
-                           [=](PointD const& p) { return Fragment{profile(p.y - t)}; }));
-    shapes.push_back(Piece(MakeRect(f.innerLeft, b - to, f.innerRight, b - from),
-                           [=](PointD const& p) { return Fragment{profile(b - p.y)}; }));
-    shapes.push_back(Piece(MakeRect(l + from, f.innerTop, l + to, f.innerBottom),
-                           [=](PointD const& p) { return Fragment{profile(p.x - l)}; }));
-    shapes.push_back(Piece(MakeRect(right - to, f.innerTop, right - from, f.innerBottom),
-                           [=](PointD const& p) { return Fragment{profile(right - p.x)}; }));
+    RectD const r = f.outer;
+    shapes.push_back(Piece(MakeRect(f.innerLeft, r.top + from, f.innerRight, r.top + to),
+                           [=](PointD const& p) { return Fragment{profile(p.y - r.top)}; }));
+    shapes.push_back(Piece(MakeRect(f.innerLeft, r.bottom - to, f.innerRight, r.bottom - from),
+                           [=](PointD const& p) { return Fragment{profile(r.bottom - p.y)}; }));
+    shapes.push_back(Piece(MakeRect(r.left + from, f.innerTop, r.left + to, f.innerBottom),
+                           [=](PointD const& p) { return Fragment{profile(p.x - r.left)}; }));
+    shapes.push_back(Piece(MakeRect(r.right - to, f.innerTop, r.right - from, f.innerBottom),
+                           [=](PointD const& p) { return Fragment{profile(r.right - p.x)}; }));
 }
 
 // 1 on the ellipse with these radii.
 double OnEllipse(PointD const& d, double a, double b) { return d.x * d.x / (a * a) + d.y * d.y / (b * b); }
 
-// As wide along the x radii as along the y radii, whatever those are; relied upon.
+// As wide along the x radii as along the y radii, whatever those are, which callers see.
 double RampWidth(double outer, double inner) { return outer * outer / (inner * inner) - 1; }
 
 Coverage CoverCorner(PointD const& d, double rx, double ry, double k, bool filled) {
@@ -81,13 +71,13 @@ Coverage CoverCorner(PointD const& d, double rx, double ry, double k, bool fille
 }
 
 void AddCorners(std::vector<Shape>& shapes, Frame const& f, double k, bool filled) {
-    RectF const reach = Grown(f.outer, k + 0.5);
+    double const reach = k + 0.5;
     for (bool const left : {true, false}) {
         for (bool const top : {true, false}) {
             PointD const center{left ? f.innerLeft : f.innerRight, top ? f.innerTop : f.innerBottom};
             RectF const quad =
-                MakeRect(center.x, center.y, static_cast<double>(left ? reach.left : reach.right),
-                         static_cast<double>(top ? reach.top : reach.bottom));
+                MakeRect(center.x, center.y, left ? f.outer.left - reach : f.outer.right + reach,
+                         top ? f.outer.top - reach : f.outer.bottom + reach);
             shapes.push_back(Piece(quad, [=](PointD const& p) {
                 return CoverCorner({p.x - center.x, p.y - center.y}, f.rx, f.ry, k, filled);
             }));
@@ -98,12 +88,11 @@ void AddCorners(std::vector<Shape>& shapes, Frame const& f, double k, bool fille
 } // namespace
 
 std::vector<Shape> FilledRoundRect(RectF const& r, double rx, double ry) {
-    Frame const f = MakeFrame(r, rx, ry);
+    Frame const f(r, rx, ry);
     std::vector<Shape> shapes;
     AddSides(shapes, f, -0.5, 0.5, [](double inset) { return inset + 0.5; });
     auto const solid = [](PointD const&) { return Fragment{1}; };
-    double const l = static_cast<double>(r.left), t = static_cast<double>(r.top);
-    double const right = static_cast<double>(r.right), b = static_cast<double>(r.bottom);
+    auto const [l, t, right, b] = f.outer;
     shapes.push_back(Piece(MakeRect(f.innerLeft, t + 0.5, f.innerRight, f.innerTop), solid));
     shapes.push_back(Piece(MakeRect(l + 0.5, f.innerTop, right - 0.5, f.innerBottom), solid));
     shapes.push_back(Piece(MakeRect(f.innerLeft, f.innerBottom, f.innerRight, b - 0.5), solid));
@@ -112,7 +101,7 @@ std::vector<Shape> FilledRoundRect(RectF const& r, double rx, double ry) {
 }
 
 std::vector<Shape> StrokedRoundRect(RectF const& r, double rx, double ry, double width) {
-    Frame const f = MakeFrame(r, rx, ry);
+    Frame const f(r, rx, ry);
     double const h = width / 2;
     std::vector<Shape> shapes;
     AddSides(shapes, f, -h - 0.5, h + 0.5,

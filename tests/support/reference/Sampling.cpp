@@ -42,7 +42,7 @@ std::array<double, 2> PlaceInBand(double q, double c, double n) {
 
 } // namespace
 
-Rgba Sample(TestImage const& image, Sampler const& sampler, double u, double v) {
+Rgba Sample(Picture const& image, Sampler const& sampler, double u, double v) {
     auto const texel = [&](int x, int y) {
         return FromBytes(
             image.GetColor(WrapIndex(x, image.width, sampler.x), WrapIndex(y, image.height, sampler.y)));
@@ -53,7 +53,7 @@ Rgba Sample(TestImage const& image, Sampler const& sampler, double u, double v) 
                Mix(texel(x.low, y.low + 1), texel(x.low + 1, y.low + 1), x.between), y.between);
 }
 
-bool IsBetweenTexels(TestImage const& image, double u, double v) {
+bool IsBetweenTexels(Picture const& image, double u, double v) {
     auto const isBetween = [](double between) { return between > 1e-3 && between < 1 - 1e-3; };
     return isBetween(Locate(u, image.width).between) || isBetween(Locate(v, image.height).between);
 }
@@ -61,29 +61,31 @@ bool IsBetweenTexels(TestImage const& image, double u, double v) {
 Coordinates BitmapQuad::GetCoordinates(PointD const& p) const {
     if (antiAliased && InsetIn(dst, p) < 0.5) return GetFringeCoordinates(p);
     RectF const solid = antiAliased ? Grown(dst, -0.5) : dst;
-    double const s = (p.x - static_cast<double>(solid.left)) / static_cast<double>(solid.GetWidth());
-    double const t = (p.y - static_cast<double>(solid.top)) / static_cast<double>(solid.GetHeight());
+    RectD const r(solid);
+    double const s = (p.x - r.left) / r.GetWidth();
+    double const t = (p.y - r.top) / r.GetHeight();
     Coordinates found;
     found.Add({Between(leftU, rightU, s), Between(topV, bottomV, t)});
     return found;
 }
 
 Coordinates BitmapQuad::GetFringeCoordinates(PointD const& p) const {
-    double const left = p.x - static_cast<double>(dst.left);
-    double const right = static_cast<double>(dst.right) - p.x;
-    double const top = p.y - static_cast<double>(dst.top);
-    double const bottom = static_cast<double>(dst.bottom) - p.y;
+    RectD const r(dst);
+    double const left = p.x - r.left;
+    double const right = r.right - p.x;
+    double const top = p.y - r.top;
+    double const bottom = r.bottom - p.y;
     double const inset = InsetIn(dst, p);
     Coordinates found;
     if (inset == left || inset == right) {
         double const u = inset == left ? leftU : rightU;
-        for (double const t : PlaceInBand(top + 0.5, inset + 0.5, static_cast<double>(dst.GetHeight()))) {
+        for (double const t : PlaceInBand(top + 0.5, inset + 0.5, r.GetHeight())) {
             found.Add({u, Between(topV, bottomV, t)});
         }
     }
     if (inset == top || inset == bottom) {
         double const v = inset == top ? topV : bottomV;
-        for (double const t : PlaceInBand(left + 0.5, inset + 0.5, static_cast<double>(dst.GetWidth()))) {
+        for (double const t : PlaceInBand(left + 0.5, inset + 0.5, r.GetWidth())) {
             found.Add({Between(leftU, rightU, t), v});
         }
     }

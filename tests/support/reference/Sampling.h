@@ -17,10 +17,10 @@ struct Sampler {
 };
 
 // Linear. u and v are 0 at the image's first column and row, 1 at the end of the last.
-Rgba Sample(TestImage const& image, Sampler const& sampler, double u, double v);
+Rgba Sample(Picture const& image, Sampler const& sampler, double u, double v);
 
 // Whether a linear filter has anything to do there.
-bool IsBetweenTexels(TestImage const& image, double u, double v);
+bool IsBetweenTexels(Picture const& image, double u, double v);
 
 // More than one where the definition leaves open which.
 struct Coordinates {

@@ -1,6 +1,6 @@
 #include "moka/base/Bitmap.h"
 
-#include "tests/unit/base/Allocation.h"
+#include "tests/support/Allocation.h"
 
 #include <gtest/gtest.h>
 

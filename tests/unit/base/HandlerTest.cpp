@@ -1,8 +1,9 @@
 #include "moka/base/Handler.h"
 #include "moka/base/MessageLoop.h"
 
-#include "moka/base/log/LogSink.h"
-#include "tests/unit/base/Allocation.h"
+#include "tests/support/Allocation.h"
+#include "tests/support/Awaited.h"
+#include "tests/support/LogCapture.h"
 
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
@@ -19,6 +20,7 @@
 namespace Moka {
 namespace {
 
+using Testing::Awaited;
 using testing::ElementsAre;
 using testing::IsEmpty;
 
@@ -49,46 +51,35 @@ private:
 
 class HandlerTest : public testing::Test {
 protected:
-    HandlerTest() {
-        SetLogSink([this](LogLine const& line) { mLines.push_back(line.text); });
-    }
-    ~HandlerTest() override { SetLogSink(nullptr); }
-
-    std::vector<std::string> mLines;
+    Testing::LogCapture log;
 };
 
-TEST_F(HandlerTest, MessagesOfAllHandlersRunInTheOrderTheyWereSent) {
+TEST_F(HandlerTest, MessagesOfAllHandlersRunInTheOrderTheyWereSentAndWaitUntilThen) {
     MessageLoop loop;
     std::vector<std::pair<char, int>> order;
-    Receiver const a([&](Handler*, int what) { order.emplace_back('a', what); });
+    std::optional<bool> whileRunning;
+    Receiver const a([&](Handler* handler, int what) {
+        order.emplace_back('a', what);
+        whileRunning = handler->HasMessage();
+    });
     Receiver const b([&](Handler*, int what) { order.emplace_back('b', what); });
+    EXPECT_FALSE(a->HasMessage());
     EXPECT_TRUE(a->SendMessage(1));
     EXPECT_TRUE(b->SendMessage(1));
     EXPECT_TRUE(a->SendMessage());
+    EXPECT_TRUE(a->HasMessage());
+    EXPECT_FALSE(a->HasMessage(5));
+    EXPECT_FALSE(b->HasMessage()) << "another handler's message";
     EXPECT_TRUE(order.empty()) << "only the loop runs messages";
     EXPECT_EQ(loop.RunPending(), 3);
     EXPECT_THAT(order, ElementsAre(std::make_pair('a', 1), std::make_pair('b', 1), std::make_pair('a', 0)));
-    EXPECT_EQ(loop.RunPending(), 0);
-}
-
-TEST_F(HandlerTest, HasMessageMeansWaitingToRun) {
-    MessageLoop loop;
-    Receiver const other;
-    std::optional<bool> whileRunning;
-    Receiver const coalesced([&](Handler* handler, int) { whileRunning = handler->HasMessage(); });
-    EXPECT_FALSE(coalesced->HasMessage());
-    coalesced->SendMessage();
-    EXPECT_TRUE(coalesced->HasMessage());
-    EXPECT_FALSE(coalesced->HasMessage(5));
-    EXPECT_FALSE(other->HasMessage()) << "another handler's message";
-    loop.RunPending();
     EXPECT_EQ(whileRunning, false) << "a result that arrives now needs a new message";
-    EXPECT_FALSE(coalesced->HasMessage());
+    EXPECT_EQ(loop.RunPending(), 0);
 }
 
 TEST_F(HandlerTest, WithoutItsLoopAHandlerRefusesEveryMessage) {
     Receiver const orphan;
-    EXPECT_EQ(mLines.size(), 1U);
+    EXPECT_EQ(log.GetLines().size(), 1U);
     auto loop = std::make_unique<MessageLoop>();
     Receiver const receiver;
     EXPECT_TRUE(receiver->SendMessage());
@@ -176,8 +167,8 @@ TEST_F(HandlerTest, AThrowingMessageIsOneErrorLine) {
     });
     for (int what = 1; what <= 3; ++what) receiver->SendMessage(what);
     EXPECT_EQ(loop.RunPending(), 3);
-    ASSERT_EQ(mLines.size(), 2U);
-    EXPECT_NE(mLines[0].find("no paper"), std::string::npos);
+    ASSERT_EQ(log.GetLines().size(), 2U);
+    EXPECT_NE(log.GetTexts()[0].find("no paper"), std::string::npos);
 }
 
 TEST_F(HandlerTest, WithoutMemoryMessagesAreRefused) {
@@ -203,10 +194,10 @@ public:
         mThread = std::thread([this, setUp] {
             MessageLoop loop;
             if (setUp) setUp();
-            mLoop = &loop; // cppcheck-suppress danglingLifetime ; not used after Run()
+            mLoop.Set(&loop); // cppcheck-suppress danglingLifetime ; not used after Run()
             loop.Run();
         });
-        while (!mLoop) std::this_thread::yield();
+        mLoop.Await([](MessageLoop* loop) { return loop != nullptr; });
     }
     ~LoopThread() { Stop(); }
     LoopThread(LoopThread const&) = delete;
@@ -214,12 +205,12 @@ public:
 
     void Stop() {
         if (!mThread.joinable()) return;
-        mLoop.load()->Quit();
+        mLoop.Get()->Quit();
         mThread.join();
     }
 
 private:
-    std::atomic<MessageLoop*> mLoop{nullptr};
+    Awaited<MessageLoop*> mLoop;
     std::thread mThread;
 };
 
@@ -227,7 +218,7 @@ TEST_F(HandlerTest, EveryThreadsMessagesArriveOnceAndInOrderOnTheLoopsThread) {
     constexpr int kSenders = 4;
     constexpr int kMessages = 2000;
     std::unique_ptr<Receiver> receiver;
-    std::atomic<int> arrived{0};
+    Awaited<int> arrived;
     std::atomic<bool> elsewhere{false};
     LoopThread loop([&] {
         receiver = std::make_unique<Receiver>([&](Handler*, int) {
@@ -239,13 +230,14 @@ TEST_F(HandlerTest, EveryThreadsMessagesArriveOnceAndInOrderOnTheLoopsThread) {
     for (int s = 0; s < kSenders; ++s) {
         senders.emplace_back([&, s] {
             for (int i = 0; i < kMessages; ++i) {
-                if (i % 100 == 0) std::this_thread::yield(); // lets the loop fall asleep now and then
+                // Lets the loop fall asleep now and then.
+                if (i % 500 == 0) std::this_thread::sleep_for(std::chrono::milliseconds(1));
                 EXPECT_TRUE((*receiver)->SendMessage(s * kMessages + i));
             }
         });
     }
     for (std::thread& sender : senders) sender.join();
-    while (arrived < kSenders * kMessages) std::this_thread::yield();
+    arrived.AwaitAtLeast(kSenders * kMessages);
     loop.Stop();
     EXPECT_FALSE(elsewhere);
     int next[kSenders] = {};
@@ -254,15 +246,15 @@ TEST_F(HandlerTest, EveryThreadsMessagesArriveOnceAndInOrderOnTheLoopsThread) {
 
 TEST_F(HandlerTest, DestructionElsewhereWaitsForTheRunningMessage) {
     std::unique_ptr<Receiver> receiver;
-    std::atomic<bool> entered{false};
+    Awaited<bool> entered;
     std::atomic<bool> destroyed{false};
     bool finished = false; // not atomic: the destructor's waiting is what makes it visible
     bool refused = false;
     LoopThread loop([&] {
         receiver = std::make_unique<Receiver>([&](Handler* handler, int) {
-            entered = true;
+            entered.Set(true);
             // Ends only when destruction has begun, which closes the handler.
-            while (handler->SendMessage(1)) std::this_thread::yield();
+            while (handler->SendMessage(1)) std::this_thread::sleep_for(std::chrono::microseconds(100));
             refused = true;
             std::this_thread::sleep_for(std::chrono::milliseconds(20));
             EXPECT_FALSE(destroyed);
@@ -270,7 +262,7 @@ TEST_F(HandlerTest, DestructionElsewhereWaitsForTheRunningMessage) {
         });
     });
     (*receiver)->SendMessage(0);
-    while (!entered) std::this_thread::yield();
+    entered.AwaitAtLeast(true);
     receiver->DestroyHandler();
     destroyed = true;
     EXPECT_TRUE(finished);
@@ -279,29 +271,23 @@ TEST_F(HandlerTest, DestructionElsewhereWaitsForTheRunningMessage) {
     EXPECT_THAT(receiver->GetReceived(), ElementsAre(0));
 }
 
-TEST_F(HandlerTest, HandlersMayComeAndGoWhileTheLoopIsBusy) {
-    for (int round = 0; round < 300; ++round) {
-        std::unique_ptr<Receiver> receiver;
-        LoopThread loop([&] { receiver = std::make_unique<Receiver>(); });
-        for (int i = 0; i < 20; ++i) (*receiver)->SendMessage(i);
-        if (round % 3 == 0) loop.Stop(); // the loop goes first
-        receiver.reset();                // a message that still ran would touch it
-    }
-}
-
 // The message can destroy the handler while the sender is still inside SendMessage.
-TEST_F(HandlerTest, AHandlerMayBeDestroyedByTheMessageBeingSent) {
-    for (int round = 0; round < 300; ++round) {
-        std::atomic<bool> done{false};
+TEST_F(HandlerTest, HandlersMayComeAndGoWhileTheLoopIsBusy) {
+    for (int round = 0; round < 600; ++round) {
+        Awaited<bool> done;
         std::unique_ptr<Receiver> receiver;
-        LoopThread const loop([&] {
-            receiver = std::make_unique<Receiver>([&](Handler*, int) {
-                receiver->DestroyHandler();
-                done = true;
+        LoopThread loop([&] {
+            receiver = std::make_unique<Receiver>([&](Handler*, int what) {
+                if (what < 0) receiver->DestroyHandler();
+                done.Set(true);
             });
         });
-        EXPECT_TRUE((*receiver)->SendMessage());
-        while (!done) std::this_thread::yield();
+        bool const isDestroyedByMessage = round % 2 == 0;
+        for (int i = 0; i < (isDestroyedByMessage ? 1 : 20); ++i)
+            (*receiver)->SendMessage(isDestroyedByMessage ? -1 : i);
+        done.AwaitAtLeast(true);
+        if (round % 3 == 0) loop.Stop(); // the loop goes first
+        receiver.reset();                // a message that still ran would touch it
     }
 }
 

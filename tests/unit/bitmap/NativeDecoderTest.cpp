@@ -1,6 +1,6 @@
 // Decoding without Java. On its own, because a process does not go back to being without the native decoder.
 #include "moka/graphics/bitmap/ImageDecoding.h"
-#include "tests/support/ArrayMemory.h"
+#include "tests/support/Allocation.h"
 #include "tests/unit/bitmap/FactoryFixture.h"
 
 #include <memory>

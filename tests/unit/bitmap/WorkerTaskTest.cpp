@@ -139,7 +139,7 @@ std::size_t SlotOf(F function) {
 #endif
 }
 
-TEST(VirtualOrder, IsTheContracts) {
+TEST(VirtualOrder, CallersFindEachFunctionInItsSlot) {
     EXPECT_EQ(SlotOf(&IGLMsgQueue::Post), 2u);
     EXPECT_EQ(SlotOf(&IGLMsgQueue::WaitForTasks), 3u);
     EXPECT_EQ(SlotOf(&ITask::run), 2u);

@@ -65,7 +65,7 @@ protected:
     }
 };
 
-TEST_F(Clipping, FractionsTruncateAsWrittenOnTexturesAndOnTheScreen) {
+TEST_F(Clipping, FractionsTruncateTowardsZeroOnTexturesAndOnTheScreen) {
     struct Case {
         Matrix3<float> matrix;
         int x, y, width, height;

@@ -1,7 +1,7 @@
 // The render side: what is skipped, which strips are drawn, and what is given back.
 #include "moka/base/log/AndroidLog.h"
 #include "moka/graphics/canvas/MKCanvasImpl.h"
-#include "tests/unit/base/Allocation.h"
+#include "tests/support/Allocation.h"
 #include "tests/unit/canvas/CanvasFixture.h"
 
 #include <optional>

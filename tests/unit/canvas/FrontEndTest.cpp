@@ -1,6 +1,6 @@
 // The caller's side of a canvas: what is copied, sent, kept and counted, and what a refusing queue leaves
 // behind.
-#include "tests/unit/base/Allocation.h"
+#include "tests/support/Allocation.h"
 #include "tests/unit/canvas/CanvasFixture.h"
 #include "tests/unit/canvas/EveryOperation.h"
 

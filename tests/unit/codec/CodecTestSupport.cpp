@@ -7,36 +7,35 @@
 
 #include <algorithm>
 #include <cmath>
-#include <fstream>
 #include <gtest/gtest.h>
-#include <iterator>
 #include <memory>
 #include <random>
+#include <turbojpeg.h>
 
 namespace Moka::Testing {
 namespace {
 
-Image FromBitmap(Bitmap* bitmap) {
+Picture FromBitmap(Bitmap* bitmap) {
     std::unique_ptr<Bitmap> const owner(bitmap);
     if (!bitmap) return {};
     EXPECT_EQ(bitmap->GetStride(), bitmap->GetWidth() * 4);
     EXPECT_TRUE(bitmap->GetDeleteBuffer());
-    Image image = MakeImage(bitmap->GetWidth(), bitmap->GetHeight());
+    Picture image(bitmap->GetWidth(), bitmap->GetHeight());
     std::copy_n(bitmap->GetBuffer(), image.pixels.size(), image.pixels.begin());
     return image;
 }
 
 } // namespace
 
-Image MakeImage(int width, int height) {
-    Image image{width, height, {}};
-    image.pixels.resize(image.GetStride() * static_cast<std::size_t>(height));
+Picture Fill(int width, int height, Color const& color) {
+    Picture image(width, height);
+    for (std::size_t i = 0; i < image.pixels.size(); ++i) image.pixels[i] = color[i % 4];
     return image;
 }
 
-Image MakeTranslucentNoise(int width, int height, unsigned seed) {
+Picture MakeTranslucentNoise(int width, int height, unsigned seed) {
     std::mt19937 random(seed);
-    Image image = MakeImage(width, height);
+    Picture image(width, height);
     for (std::size_t i = 0; i < image.pixels.size(); i += 4) {
         unsigned const alpha = random() % 256;
         for (std::size_t c = 0; c < 3; ++c)
@@ -46,12 +45,12 @@ Image MakeTranslucentNoise(int width, int height, unsigned seed) {
     return image;
 }
 
-Image MakeOpaqueNoise(int width, int height) {
+Picture MakeOpaqueNoise(int width, int height) {
     return FlattenOnWhite(MakeTranslucentNoise(width, height, 1));
 }
 
-Image MakeGradient(int width, int height, bool isOpaque) {
-    Image image = MakeImage(width, height);
+Picture MakeGradient(int width, int height, bool isOpaque) {
+    Picture image(width, height);
     std::size_t i = 0;
     for (int y = 0; y < height; ++y) {
         for (int x = 0; x < width; ++x) {
@@ -66,7 +65,7 @@ Image MakeGradient(int width, int height, bool isOpaque) {
     return image;
 }
 
-Image FlattenOnWhite(Image image) {
+Picture FlattenOnWhite(Picture image) {
     for (std::size_t i = 0; i < image.pixels.size(); i += 4) {
         int const white = 255 - image.pixels[i + 3];
         for (std::size_t c = 0; c < 4; ++c)
@@ -75,32 +74,25 @@ Image FlattenOnWhite(Image image) {
     return image;
 }
 
-Image Scale(Image const& source, int width, int height) {
-    Image result = MakeImage(width, height);
+Picture Scale(Picture const& source, int width, int height) {
+    Picture result(width, height);
     detail::RowScaler scaler({source.width, source.height}, {width, height}, result.pixels.data());
     EXPECT_TRUE(scaler.IsReady());
-    for (int y = 0; y < source.height; ++y) scaler.Push(source.Row(y));
+    for (int y = 0; y < source.height; ++y) scaler.Push(source.At(0, y));
     return result;
 }
 
-int LargestDifference(Image const& a, Image const& b) {
-    if (a.width != b.width || a.height != b.height || a.pixels.empty()) return 256;
-    int largest = 0;
-    for (std::size_t i = 0; i < a.pixels.size(); ++i) {
-        largest = std::max(largest, std::abs(a.pixels[i] - b.pixels[i]));
-    }
-    return largest;
+int LargestDifference(Picture const& a, Picture const& b) {
+    return a.pixels.empty() ? 256 : CompareImages(a, b).largest;
 }
 
-void WriteFile(std::string const& path, Bytes const& bytes) {
-    std::ofstream file(path, std::ios::binary);
-    file.write(reinterpret_cast<char const*>(bytes.data()), static_cast<std::streamsize>(bytes.size()));
-    ASSERT_TRUE(file.good()) << path;
+void WriteBytes(std::string const& path, Bytes const& bytes) {
+    WriteFile(path, std::string(bytes.begin(), bytes.end()));
 }
 
-Bytes ReadFile(std::string const& path) {
-    std::ifstream file(path, std::ios::binary);
-    return Bytes(std::istreambuf_iterator<char>(file), {});
+Bytes ReadBytes(std::string const& path) {
+    std::string const content = ReadFile(path);
+    return Bytes(content.begin(), content.end());
 }
 
 ErrorLines::ErrorLines()
@@ -121,16 +113,16 @@ std::vector<std::string> ErrorLines::Take() {
     return lines;
 }
 
-Image Decode(Bytes const& file, char const* name) {
+Picture Decode(Bytes const& file, char const* name) {
     return FromBitmap(BitmapFactory::CreateBitmapFromMemory(file.data(), file.size(), name));
 }
 
-Image DecodeFile(std::string const& path) {
+Picture DecodeFile(std::string const& path) {
     String const text(path);
     return FromBitmap(BitmapFactory::CreateBitmapForGraphics(&text));
 }
 
-Image DecodeScaled(std::string const& path, int width, int height) {
+Picture DecodeScaled(std::string const& path, int width, int height) {
     String const text(path);
     return FromBitmap(BitmapFactory::CreateBitmap(&text, width, height));
 }
@@ -142,25 +134,30 @@ ImageInfo GetInfo(std::string const& path) {
     return info;
 }
 
-bool Save(Image const& image, std::string const& path, int quality) {
-    Bitmap bitmap;
-    Bytes pixels = image.pixels;
-    EXPECT_TRUE(bitmap.Construct(pixels.data(), image.width, image.height, image.width * 4, 1, false, false));
-    String const text(path);
-    return BitmapFactory::SaveBitmap(&bitmap, &text, quality);
-}
-
-std::string SaveIn(TempFolder const& folder, Image const& image, std::string const& extension) {
+std::string SaveIn(TempFolder const& folder, Picture const& image, std::string const& extension) {
     std::string const path = folder.Path("image." + extension);
-    EXPECT_TRUE(Save(image, path, 100)) << path;
+    EXPECT_TRUE(SaveImage(image, path)) << path;
     return path;
 }
 
-Bytes Encode(Image const& image, std::string const& extension, int quality) {
+Bytes MakeJpeg(Bytes const& pixels, int width, int height, int format, int subsampling, int flags) {
+    tjhandle const handle = tjInitCompress();
+    unsigned char* encoded = nullptr;
+    unsigned long size = 0;
+    EXPECT_EQ(tjCompress2(handle, pixels.data(), width, 0, height, format, &encoded, &size, subsampling, 100,
+                          flags),
+              0);
+    Bytes bytes(encoded, encoded + size);
+    tjFree(encoded);
+    tjDestroy(handle);
+    return bytes;
+}
+
+Bytes Encode(Picture const& image, std::string const& extension, int quality) {
     TempFolder const folder;
     std::string const path = folder.Path("image." + extension);
-    EXPECT_TRUE(Save(image, path, quality));
-    return ReadFile(path);
+    EXPECT_TRUE(SaveImage(image, path, quality));
+    return ReadBytes(path);
 }
 
 Bytes Replace(Bytes bytes, std::size_t at, Bytes const& with) {

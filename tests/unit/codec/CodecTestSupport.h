@@ -3,6 +3,7 @@
 
 #include "moka/base/BitmapFactory.h"
 #include "moka/base/log/LogSink.h"
+#include "tests/support/ImageCompare.h"
 #include "tests/support/TestFiles.h"
 
 #include <cstdint>
@@ -13,37 +14,23 @@ namespace Moka::Testing {
 
 using Bytes = std::vector<unsigned char>;
 
-struct Image {
-    int width = 0;
-    int height = 0;
-    Bytes pixels; // RGBA8, premultiplied; empty when there is no image
-
-    std::size_t GetStride() const { return static_cast<std::size_t>(width) * 4; } // bytes
-    unsigned char const* Row(int y) const {
-        return pixels.data() + static_cast<std::size_t>(y) * GetStride();
-    }
-    friend bool operator==(Image const& a, Image const& b) {
-        return a.width == b.width && a.height == b.height && a.pixels == b.pixels;
-    }
-};
-
-// Transparent.
-Image MakeImage(int width, int height);
+// Every pixel the same.
+Picture Fill(int width, int height, Color const& color);
 // Every alpha occurs, and colours from 0 up to it.
-Image MakeTranslucentNoise(int width, int height, unsigned seed = 1);
-Image MakeOpaqueNoise(int width, int height);
+Picture MakeTranslucentNoise(int width, int height, unsigned seed = 1);
+Picture MakeOpaqueNoise(int width, int height);
 // Smooth, so that lossy codecs come close.
-Image MakeGradient(int width, int height, bool isOpaque);
-Image FlattenOnWhite(Image image);
+Picture MakeGradient(int width, int height, bool isOpaque);
+Picture FlattenOnWhite(Picture image);
 
 // As the codecs' own scaler does it.
-Image Scale(Image const& source, int width, int height);
+Picture Scale(Picture const& source, int width, int height);
 
 // The greatest difference of any byte; 256 when the sizes differ.
-int LargestDifference(Image const& a, Image const& b);
+int LargestDifference(Picture const& a, Picture const& b);
 
-void WriteFile(std::string const& path, Bytes const& bytes);
-Bytes ReadFile(std::string const& path);
+void WriteBytes(std::string const& path, Bytes const& bytes);
+Bytes ReadBytes(std::string const& path);
 
 // Error lines while it lives. Everything else fails the test: codecs have nothing else to say.
 class ErrorLines {
@@ -61,16 +48,17 @@ private:
 };
 
 // Empty images when the factory returns null.
-Image Decode(Bytes const& file, char const* name = "test");
-Image DecodeFile(std::string const& path);
-Image DecodeScaled(std::string const& path, int width, int height);
+Picture Decode(Bytes const& file, char const* name = "test");
+Picture DecodeFile(std::string const& path);
+Picture DecodeScaled(std::string const& path, int width, int height);
 // Fails the test when the factory finds none.
 ImageInfo GetInfo(std::string const& path);
-bool Save(Image const& image, std::string const& path, int quality);
 // As image.EXTENSION; fails the test when it cannot be saved. Returns the path.
-std::string SaveIn(TempFolder const& folder, Image const& image, std::string const& extension);
+std::string SaveIn(TempFolder const& folder, Picture const& image, std::string const& extension);
+// By libjpeg-turbo, of pixels in one of its formats.
+Bytes MakeJpeg(Bytes const& pixels, int width, int height, int format, int subsampling, int flags = 0);
 // The file's bytes.
-Bytes Encode(Image const& image, std::string const& extension, int quality = 100);
+Bytes Encode(Picture const& image, std::string const& extension, int quality = 100);
 
 // Edits in a copy.
 Bytes Replace(Bytes bytes, std::size_t at, Bytes const& with);

@@ -1,6 +1,6 @@
 #include "moka/base/String.h"
 #include "moka/base/System.h"
-#include "tests/support/ArrayMemory.h"
+#include "tests/support/Allocation.h"
 #include "tests/unit/codec/CodecTestSupport.h"
 
 #include <gmock/gmock.h>
@@ -50,7 +50,7 @@ protected:
 
 TEST_F(Malformed, EveryTruncationIsRefused) {
     for (Kind const& kind : kKinds) {
-        for (Image const& image : {MakeTranslucentNoise(7, 5), MakeOpaqueNoise(16, 16)}) {
+        for (Picture const& image : {MakeTranslucentNoise(7, 5), MakeOpaqueNoise(16, 16)}) {
             Bytes const file = Encode(image, kind.extension, kind.quality);
             ASSERT_FALSE(Refuses(file));
             for (std::size_t size = 0; size < file.size(); ++size) {
@@ -63,7 +63,7 @@ TEST_F(Malformed, EveryTruncationIsRefused) {
 
 // With checksums wrong pixels are never shown, and no header is believed that is not the one written.
 TEST_F(Malformed, EveryChangedByteIsRefusedOrHarmless) {
-    Image const image = MakeTranslucentNoise(7, 5);
+    Picture const image = MakeTranslucentNoise(7, 5);
     for (Kind const& kind : kKinds) {
         Bytes const file = Encode(image, kind.extension, kind.quality);
         for (std::size_t i = 0; i < file.size(); ++i) {
@@ -132,10 +132,10 @@ TEST_F(Malformed, ClaimsOutsideTheLimitsAreRefusedBeforeAnythingIsAllocated) {
 
 TEST_F(Malformed, WhatIsNoImageFileIsRefusedByEveryReader) {
     TempFolder const folder;
-    WriteFile(folder.Path("empty.png"), {});
-    WriteFile(folder.Path("text.png"), {'h', 'e', 'l', 'l', 'o'});
+    WriteBytes(folder.Path("empty.png"), {});
+    WriteBytes(folder.Path("text.png"), {'h', 'e', 'l', 'l', 'o'});
     ASSERT_EQ(mkfifo(folder.Path("pipe.png").c_str(), 0600), 0);
-    WriteFile(folder.Path("large.png"), Encode(MakeOpaqueNoise(4, 4), "png"));
+    WriteBytes(folder.Path("large.png"), Encode(MakeOpaqueNoise(4, 4), "png"));
     ASSERT_EQ(truncate(folder.Path("large.png").c_str(), off_t{1} << 31), 0); // sparse
     struct {
         std::string path;

@@ -48,17 +48,17 @@ Bytes Compress(Bytes const& content, int level = 1, bool hasChecksum = true, boo
     return frame;
 }
 
-TEST(Mki, ReadsFilesMadeByTheBook) {
+TEST(Mki, ReadsFilesThatItDidNotWrite) {
     ErrorLines const errors;
-    Image const image = MakeTranslucentNoise(3, 2);
+    Picture const image = MakeTranslucentNoise(3, 2);
     for (int const level : {1, 19}) EXPECT_EQ(Decode(MakeMki({3, 2}, Compress(image.pixels, level))), image);
     EXPECT_EQ(Decode(MakeMki({3, 2, 1, 0}, image.pixels)), image) << "stored";
-    Image const invalid{1, 1, {9, 200, 0, 5}};
+    Picture const invalid = Fill(1, 1, {9, 200, 0, 5});
     EXPECT_EQ(Decode(MakeMki({1, 1, 1, 0}, invalid.pixels)), invalid) << "pixels are taken as they are";
 }
 
-TEST(Mki, WritesFilesByTheBook) {
-    Image const image = MakeTranslucentNoise(700, 301);
+TEST(Mki, WritesTheHeaderAndOneChecksummedFrame) {
+    Picture const image = MakeTranslucentNoise(700, 301);
     Bytes const file = Encode(image, "mki");
     Bytes const payload(file.begin() + 32, file.end());
     EXPECT_EQ(file, MakeMki({700, 301}, payload));

@@ -23,12 +23,12 @@ double ReferenceWeight(int from, int to, int i, int j) {
     return std::max(0.0, 1 - std::abs(centre - i));
 }
 
-double ReferenceChannel(Image const& source, int width, int height, int x, int y, int channel) {
+double ReferenceChannel(Picture const& source, int width, int height, int x, int y, int channel) {
     double sum = 0;
     for (int v = 0; v < source.height; ++v) {
         double const down = ReferenceWeight(source.height, height, v, y);
         for (int u = 0; down > 0 && u < source.width; ++u)
-            sum += down * ReferenceWeight(source.width, width, u, x) * source.Row(v)[u * 4 + channel];
+            sum += down * ReferenceWeight(source.width, width, u, x) * source.At(0, v)[u * 4 + channel];
     }
     return sum;
 }
@@ -37,10 +37,10 @@ TEST(RowScaler, IsTheRoundedReferenceForEveryMixOfShrinkingAndGrowing) {
     std::mt19937 random(7);
     for (int round = 0; round < 300; ++round) {
         auto const side = [&random] { return 1 + static_cast<int>(random() % 24); };
-        Image const source = MakeTranslucentNoise(side(), side(), static_cast<unsigned>(round));
+        Picture const source = MakeTranslucentNoise(side(), side(), static_cast<unsigned>(round));
         int const width = side();
         int const height = round % 50 == 0 ? source.height : side();
-        Image const scaled = Scale(source, width, height);
+        Picture const scaled = Scale(source, width, height);
         for (int i = 0; i < width * height * 4; ++i) {
             unsigned char const* const pixel = &scaled.pixels[static_cast<std::size_t>(i / 4 * 4)];
             double const exact = ReferenceChannel(source, width, height, i / 4 % width, i / 4 / width, i % 4);
@@ -61,7 +61,7 @@ TEST(RowScaler, TheLongestSidesOverflowNothing) {
                        {{1, kLong}, {1, 1}},
                        {{2, 2}, {kLong, 3}}};
     for (auto const& [from, to] : cases) {
-        Image white = MakeImage(from.width, from.height);
+        Picture white(from.width, from.height);
         std::fill(white.pixels.begin(), white.pixels.end(), static_cast<unsigned char>(255));
         Bytes const scaled = Scale(white, to.width, to.height).pixels;
         EXPECT_TRUE(std::all_of(scaled.begin(), scaled.end(), [](int byte) { return byte == 255; }));
@@ -69,7 +69,7 @@ TEST(RowScaler, TheLongestSidesOverflowNothing) {
 }
 
 TEST(RowScaler, ShrinksWithinTheMemoryOfItsSource) {
-    Image const source = MakeTranslucentNoise(20, 13);
+    Picture const source = MakeTranslucentNoise(20, 13);
     for (PixelSize const to :
          {PixelSize{20, 13}, PixelSize{19, 12}, PixelSize{20, 12}, PixelSize{3, 13}, PixelSize{7, 5}}) {
         Bytes memory = source.pixels;
@@ -88,11 +88,11 @@ constexpr std::pair<int, int> kSizes[] = {{200, 150}, {199, 149}, {100, 75}, {10
 // rows here instead of 150, which shifts the far edge by a part of a pixel.
 TEST(ScaledDecode, EveryFormatHasTheExactSizeAndTheScalersPixelsOrClose) {
     TempFolder const folder;
-    Image const noise = MakeTranslucentNoise(200, 150);
-    Image const smooth = MakeGradient(200, 150, true);
+    Picture const noise = MakeTranslucentNoise(200, 150);
+    Picture const smooth = MakeGradient(200, 150, true);
     struct {
         char const* extension;
-        Image const& image;
+        Picture const& image;
         int tolerance;
     } const cases[] = {{"png", noise, 0}, {"mki", noise, 0}, {"jpg", smooth, 8}, {"webp", smooth, 2}};
     for (auto const& [extension, image, tolerance] : cases) {
@@ -107,13 +107,13 @@ TEST(ScaledDecode, EveryFormatHasTheExactSizeAndTheScalersPixelsOrClose) {
 
 TEST(ScaledDecode, TransparentColourDoesNotBleedIntoWhatRemains) {
     // Red ink on nothing: whatever it is scaled to, it stays pure red under its alpha.
-    Image ink = MakeImage(64, 64);
+    Picture ink(64, 64);
     for (std::size_t i = 0; i < ink.pixels.size(); i += 4 * 3) ink.pixels[i] = ink.pixels[i + 3] = 255;
     TempFolder const folder;
     for (char const* extension : {"png", "mki", "webp"}) {
         std::string const path = SaveIn(folder, ink, extension);
         for (int side : {7, 32, 100}) {
-            Image const scaled = DecodeScaled(path, side, side);
+            Picture const scaled = DecodeScaled(path, side, side);
             ASSERT_EQ(scaled.width, side);
             for (std::size_t i = 0; i < scaled.pixels.size(); i += 4) {
                 ASSERT_EQ(scaled.pixels[i], scaled.pixels[i + 3]) << extension << ' ' << side;
@@ -127,7 +127,7 @@ TEST(ScaledDecode, RefusesSizesOutsideTheLimits) {
     ErrorLines errors;
     TempFolder const folder;
     std::string const path = folder.Path("image.png");
-    ASSERT_TRUE(Save(MakeOpaqueNoise(4, 4), path, 100));
+    ASSERT_TRUE(SaveImage(MakeOpaqueNoise(4, 4), path));
     constexpr int kBad[][2] = {{0, 5}, {5, 0}, {-1, 5}, {65536, 1}, {1, 65536}, {20000, 20000}};
     for (auto const& size : kBad) {
         EXPECT_TRUE(DecodeScaled(path, size[0], size[1]).pixels.empty());

@@ -4,7 +4,7 @@
 #include "moka/graphics/drawable/MKLineDrawable.h"
 #include "moka/graphics/drawable/MKRectDrawable.h"
 #include "moka/graphics/drawable/MKRoundRectDrawable.h"
-#include "tests/unit/base/Allocation.h"
+#include "tests/support/Allocation.h"
 #include "tests/unit/drawable/DrawableFixture.h"
 
 #include <memory>

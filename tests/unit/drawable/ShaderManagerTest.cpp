@@ -1,5 +1,5 @@
 #include "moka/graphics/drawable/ShaderExceptions.h"
-#include "tests/unit/base/Allocation.h"
+#include "tests/support/Allocation.h"
 #include "tests/unit/drawable/ShaderFixture.h"
 
 #include <atomic>

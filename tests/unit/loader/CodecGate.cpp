@@ -1,12 +1,12 @@
 #include "tests/unit/loader/CodecGate.h"
 
 #include "moka/base/BitmapFactory.h"
+#include "tests/support/Awaited.h"
 
 #include <atomic>
 #include <cstdlib>
 #include <new>
 #include <shared_mutex>
-#include <thread>
 #include <utility>
 
 #include <dlfcn.h>
@@ -20,14 +20,15 @@ std::shared_mutex& TheGate() {
     return gate;
 }
 
-std::atomic<int> waiting{0};
+// Never destroyed either.
+Testing::Awaited<int>& passing = *new Testing::Awaited<int>;
 std::atomic<bool> throwing{false};
 
 void Pass() {
     if (throwing) throw std::bad_alloc();
-    ++waiting;
+    ++passing;
     { std::shared_lock<std::shared_mutex> const pass(TheGate()); }
-    --waiting;
+    passing.Update([](int& count) { --count; });
 }
 
 // The library's own function, which the one of the same name here hides.
@@ -66,9 +67,7 @@ namespace Testing {
 CodecGate::CodecGate() { TheGate().lock(); }
 CodecGate::~CodecGate() { Open(); }
 
-void CodecGate::AwaitArrival() {
-    while (waiting == 0) std::this_thread::yield();
-}
+void CodecGate::AwaitArrival() { passing.AwaitAtLeast(1); }
 
 void CodecGate::Open() {
     if (std::exchange(mIsClosed, false)) TheGate().unlock();

@@ -40,7 +40,7 @@ using FrontEnds = ::testing::Types<MKBitmapLoader, BitmapLoader>;
 TYPED_TEST_SUITE(EitherFrontEnd, FrontEnds, );
 
 TYPED_TEST(EitherFrontEnd, LogsAndCallsInBothKindsOfBuild) {
-    TestImage const image = MakeGradient(5, 4);
+    Picture const image = MakeGradient(5, 4);
     String const path = this->WritePicture("a.mki");
     String const missing = this->Path("missing.mki");
     String const bad = this->Path("bad.unknown");
@@ -139,13 +139,12 @@ TYPED_TEST(EitherFrontEnd, DestroyedWhileDecodingItCallsNobodyAndDoesNotWait) {
 
 TYPED_TEST(EitherFrontEnd, DestroyedWhileCallingItWaitsForTheCall) {
     String const path = this->WritePicture("a.mki");
-    Flag entered;
-    Flag mayLeave;
+    Awaited<bool> entered, mayLeave;
     bool left = false; // not atomic: the destructor is what makes it visible
     auto callback = MakeCallback<TypeParam>(this->listener);
     callback.onLoad = [&](int, String const&, auto&) {
-        entered.Set();
-        mayLeave.Wait();
+        entered.Set(true);
+        mayLeave.AwaitAtLeast(true);
         // Time for a destructor that does not wait.
         std::this_thread::sleep_for(std::chrono::milliseconds(20));
         left = true;
@@ -153,14 +152,14 @@ TYPED_TEST(EitherFrontEnd, DestroyedWhileCallingItWaitsForTheCall) {
     auto loader = std::make_unique<TypeParam>("pad", &callback);
     loader->RequestLoad(1, path, this->queue.get());
     loader->RequestLoad(2, path, this->queue.get());
-    entered.Wait();
+    entered.AwaitAtLeast(true);
     std::string const line = this->Line(*loader, std::string("~") + this->kName);
     std::thread destroyer([&] {
         loader.reset();
         EXPECT_TRUE(left);
     });
-    this->AwaitLine(line);
-    mayLeave.Set();
+    this->log.AwaitLines(line);
+    mayLeave.Set(true);
     destroyer.join();
 }
 
@@ -169,7 +168,7 @@ TYPED_TEST(EitherFrontEnd, ACallbackMayRequestCancelAndDestroyOthers) {
     auto callback = MakeCallback<TypeParam>(this->listener);
     TypeParam loader("pad", &callback);
     auto other = std::make_unique<TypeParam>("other", &callback);
-    Flag done;
+    Awaited<bool> done;
     auto busy = MakeCallback<TypeParam>(this->listener);
     busy.onLoadError = [&](int, String const&) {
         other.reset();
@@ -177,7 +176,7 @@ TYPED_TEST(EitherFrontEnd, ACallbackMayRequestCancelAndDestroyOthers) {
         EXPECT_TRUE(loader.RequestLoad(1, path, nullptr, 2, 2));
         EXPECT_TRUE(loader.RequestSave(3, this->Path("s.png"), new unsigned char[4](), 1, 1, nullptr, 100));
         loader.CancelAllLoadRequest();
-        done.Set();
+        done.Set(true);
     };
     TypeParam acting("acting", &busy);
     CodecGate gate;
@@ -185,7 +184,7 @@ TYPED_TEST(EitherFrontEnd, ACallbackMayRequestCancelAndDestroyOthers) {
     loader.RequestLoad(1, path, this->queue.get());
     other->RequestLoad(2, path, this->queue.get());
     gate.Open();
-    done.Wait();
+    done.AwaitAtLeast(true);
     this->AwaitAll();
     EXPECT_EQ(this->listener.GetEvents(), Events{"save 3"});
     loader.WaitForCallback();
@@ -212,7 +211,7 @@ TEST_F(FrontEnd, TheTwoKindsShareOneQueueAndOneThread) {
 }
 
 TEST_F(FrontEnd, BitmapsAreSavedAndTheLoaderFreesACpuBitmapsPixels) {
-    TestImage image = MakeAlphaPattern(20, 10);
+    Picture image = MakeAlphaPattern(20, 10);
     auto onGpu = MakeCallback<MKBitmapLoader>(listener);
     auto onCpu = MakeCallback<BitmapLoader>(listener);
     MKBitmapLoader graphics("graphics", &onGpu);

@@ -3,7 +3,6 @@
 #pragma once
 
 #include "moka/base/Bitmap.h"
-#include "moka/base/BitmapFactory.h"
 #include "moka/base/RefPtr.h"
 #include "moka/base/String.h"
 #include "moka/base/System.h"
@@ -20,13 +19,9 @@
 #include "tests/unit/loader/CodecGate.h"
 
 #include <algorithm>
-#include <condition_variable>
 #include <filesystem>
-#include <fstream>
 #include <functional>
-#include <future>
 #include <gtest/gtest.h>
-#include <iterator>
 #include <memory>
 #include <mutex>
 #include <string>
@@ -37,17 +32,6 @@ namespace Moka::Testing {
 
 using detail::BitmapLoaderImpl;
 using Pixels = std::vector<unsigned char>;
-
-// A flag that threads wait for.
-class Flag {
-public:
-    void Set() { mPromise.set_value(); }
-    void Wait() const { mFuture.wait(); }
-
-private:
-    std::promise<void> mPromise;
-    std::shared_future<void> mFuture{mPromise.get_future()};
-};
 
 class LoaderFixture : public ::testing::Test {
 protected:
@@ -81,34 +65,26 @@ protected:
         EXPECT_TRUE(SaveImage(MakeGradient(width, height), folder.Path(name)));
         return Path(name);
     }
-    std::string ReadBytes(std::string const& name) const {
-        std::ifstream file(folder.Path(name), std::ios::binary);
-        return {std::istreambuf_iterator<char>(file), {}};
-    }
+    std::string ReadBytes(std::string const& name) const { return ReadFile(folder.Path(name)); }
 
-    static unsigned char* NewPixels(TestImage const& image) {
+    static unsigned char* NewPixels(Picture const& image) {
         auto* const pixels = new unsigned char[image.pixels.size()];
         std::copy(image.pixels.begin(), image.pixels.end(), pixels);
         return pixels;
     }
-    RefPtr<IMKBitmap> MakeBitmap(TestImage const& image) const {
+    RefPtr<IMKBitmap> MakeBitmap(Picture const& image) const {
         return RefPtr<IMKBitmap>::Adopt(MKGraphicsFactory::CreateBitmap(
             queue.get(), image.width, image.height, NewPixels(image), true, 1, false));
     }
 
-    void AwaitLine(std::string const& text) const {
-        while (!log.Has(text)) std::this_thread::yield();
-    }
     // The loop has said its last word on what was queued so far.
     void AwaitIdle() const {
-        auto const isIdle = [this] {
-            std::vector<LogLine> const lines = log.GetLines();
-            for (auto line = lines.rbegin(); line != lines.rend(); ++line)
-                if (line->text.find("::EventLoop ") != std::string::npos)
-                    return line->text == "BitmapLoaderImpl::EventLoop Wait!";
-            return true;
-        };
-        while (!isIdle()) std::this_thread::yield();
+        log.Await([](std::vector<LogLine> const& lines) {
+            auto const last = std::find_if(lines.rbegin(), lines.rend(), [](LogLine const& line) {
+                return line.text.find("::EventLoop ") != std::string::npos;
+            });
+            return last == lines.rend() || last->text == "BitmapLoaderImpl::EventLoop Wait!";
+        });
     }
     std::vector<std::string> LinesOf(std::string const& tag) const {
         std::vector<std::string> texts;
@@ -134,10 +110,7 @@ public:
     void OnCallbackPending() override { Note("pending"); }
     void OnCallbackCompleted() override { Note("completed"); }
 
-    std::vector<std::string> GetEvents() const {
-        std::lock_guard<std::mutex> const lock(mMutex);
-        return mEvents;
-    }
+    std::vector<std::string> GetEvents() const { return mEvents.Get(); }
     // What became of one request after the other: the event between "pending" and "completed".
     std::vector<std::string> GetResults() const {
         std::vector<std::string> results = GetEvents();
@@ -147,9 +120,8 @@ public:
     }
     // Until this many requests have been completed.
     void AwaitCompleted(int count) const {
-        std::unique_lock<std::mutex> lock(mMutex);
-        mChanged.wait(lock, [&] {
-            return std::count(mEvents.begin(), mEvents.end(), std::string("completed")) >= count;
+        mEvents.Await([count](std::vector<std::string> const& events) {
+            return std::count(events.begin(), events.end(), std::string("completed")) >= count;
         });
     }
 
@@ -171,17 +143,11 @@ private:
     // The listener may be gone as soon as the event is seen.
     void Note(std::string const& event) {
         auto const hook = whenNoted;
-        {
-            std::lock_guard<std::mutex> const lock(mMutex);
-            mEvents.push_back(event);
-            mChanged.notify_all();
-        }
+        mEvents.Update([&](auto& events) { events.push_back(event); });
         if (hook) hook(event);
     }
 
-    std::mutex mutable mMutex;
-    std::condition_variable mutable mChanged;
-    std::vector<std::string> mEvents;
+    Awaited<std::vector<std::string>> mEvents;
 };
 
 // The callbacks of a front end of either kind, which tell the listener.

@@ -45,7 +45,7 @@ protected:
         AwaitIdle();
     }
 
-    TestImage image = MakeGradient(20, 2 * kMaxSide);
+    Picture image = MakeGradient(20, 2 * kMaxSide);
     std::mutex mutex;
     Events results;
     void* lastUserData = nullptr;

@@ -2,8 +2,9 @@
 #include "tests/unit/loader/LoaderFixture.h"
 
 #include "moka/graphics/bitmap/MKBitmap.h"
+#include "moka/graphics/loader/BitmapLoader.h"
+#include "tests/support/Allocation.h"
 #include "tests/support/Queues.h"
-#include "tests/unit/base/Allocation.h"
 
 #include <cstring>
 #include <limits>
@@ -39,7 +40,7 @@ protected:
         return ReadBytes("direct." + extension);
     }
 
-    TestImage image = MakeAlphaPattern(40, 30);
+    Picture image = MakeAlphaPattern(40, 30);
     RecordingListener listener;
 };
 
@@ -95,19 +96,19 @@ TEST_F(Save, WithoutAListenerTheFileIsWrittenAndWithoutPixelsItIsRefused) {
 }
 
 TEST_F(Save, WhatABitmapDoesNotCoverIsTransparent) {
-    TestImage const whole = MakeGradient(8, 8);
+    Picture const whole = MakeGradient(8, 8);
     auto const bitmap = RefPtr<IMKBitmap>::Adopt(
         MKGraphicsFactory::CreateBitmap(queue.get(), Rect(0, 2, 8, 5), 8, 8, whole.pixels.data(), 1));
     EXPECT_TRUE(Loader().RequestSave(&listener, 1, Path("s.png"), *bitmap, nullptr, 100));
     MKBitmapLoader::WaitForAllSaveRequestsToEnd(queue.get());
-    image = TestImage(8, 8);
+    image = Picture(8, 8);
     for (int y = 2; y < 5; ++y)
         for (int x = 0; x < 8; ++x) image.SetColor(x, y, whole.GetColor(x, y));
     EXPECT_EQ(ReadBytes("s.png"), EncodedDirectly("png"));
 }
 
 TEST_F(Save, WaitersWaitForTheReadBackAndTheFile) {
-    image = TestImage(4, 3);
+    image = Picture(4, 3);
     std::fill(image.pixels.begin(), image.pixels.end(), static_cast<unsigned char>(0xFF));
     HeldBitmap bitmap(4, 3);
     EXPECT_TRUE(Loader().RequestSave(&listener, 1, Path("s.png"), bitmap, nullptr, 100));
@@ -118,7 +119,7 @@ TEST_F(Save, WaitersWaitForTheReadBackAndTheFile) {
             EXPECT_TRUE(Exists("s.png"));
             EXPECT_EQ(listener.GetEvents().size(), 3u);
         });
-    while (log.Count(ANDROID_LOG_INFO, "SaveTaskRunning -> Start Wait") < 3) std::this_thread::yield();
+    log.AwaitLines("SaveTaskRunning -> Start Wait", 3);
     EXPECT_TRUE(log.Has("WaitForAllSaveRequestsToEnd - SaveTaskRunning -> Start Wait, "
                         "mPendingSaveRequestList->GetCount() = 1, mQueue->GetCount() = 0, "
                         "mSaveTaskRunning = 0"));
@@ -128,6 +129,13 @@ TEST_F(Save, WaitersWaitForTheReadBackAndTheFile) {
     gate.Open();
     for (std::thread& waiter : waiters) waiter.join();
     EXPECT_EQ(ReadBytes("s.png"), EncodedDirectly("png"));
+}
+
+TEST_F(Save, WaitingForAllRunsTheRenderThreadsTasksFirst) {
+    HandPumpedQueue pumped;
+    MKBitmapLoader::WaitForAllSaveRequestsToEnd(&pumped);
+    BitmapLoader::WaitForAllSaveRequestsToEnd(&pumped);
+    EXPECT_EQ(pumped.GetWaitCount(), 2);
 }
 
 // Pending, waiting in the queue, and being encoded.

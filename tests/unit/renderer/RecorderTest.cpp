@@ -8,8 +8,8 @@
 #include "moka/renderer/RendererFactory.h"
 #include "moka/renderer/record/Observer.h"
 #include "moka/renderer/record/ProgramState.h"
+#include "tests/support/Allocation.h"
 #include "tests/support/RendererTrace.h"
-#include "tests/unit/base/Allocation.h"
 
 #include <gtest/gtest.h>
 

@@ -5,7 +5,7 @@
 #include "scenes/SceneText.h"
 #include "tests/support/LogCapture.h"
 #include "tests/support/TestFiles.h"
-#include "tests/unit/scenes/CanvasLog.h"
+#include "tests/unit/scenes/ScenePainting.h"
 
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
@@ -16,7 +16,6 @@ namespace {
 using Scenes::ParseScene;
 using Scenes::Scene;
 using Scenes::SceneError;
-using ::testing::ElementsAre;
 using ::testing::HasSubstr;
 using ::testing::StartsWith;
 
@@ -25,11 +24,33 @@ std::string WithOperations(std::string const& operations) {
     return "{\n\"size\": [8, 6],\n\"operations\": [\n" + operations + "\n]}\n";
 }
 
-std::vector<std::string> Play(std::string const& text) {
-    RefPtr<CanvasLog> const canvas = PlayScene(ParseScene(text, "test", ""));
-    std::vector<std::string> const& lines = canvas->GetLines();
-    EXPECT_THAT(lines.front(), StartsWith("ClearAll"));
-    return {lines.begin() + 1, lines.end()};
+using Calls = std::function<void(IMKCanvas&, IMKBitmap* checker, IMKBitmap* photo)>;
+
+// Operations on blue, with the bitmaps "checker" and "photo", draw what the calls draw, and something. The probe
+// after both shows what they leave of the canvas's state.
+void ExpectDraws(std::string const& operations, Calls const& calls, std::string const& paints = "") {
+    SCOPED_TRACE(operations);
+    std::string const probe = R"({"DrawBitmap": {"bitmap": "checker", "dst": [6, 5, 30, 20]}})";
+    std::string const begin =
+        R"({"size": [40, 30], "background": [0, 0, 0.5, 0.5], "paints": {)" + paints + R"(},
+        "bitmaps": {"checker": {"picture": "checker", "width": 12, "height": 10},
+                    "photo": {"picture": "photo", "width": 7, "height": 3}}, "operations": [)";
+    auto const paint = [&](std::string const& drawn) {
+        Scene const scene = ParseScene(begin + drawn + probe + "]}", "test", "");
+        return Paint(scene.width, scene.height,
+                     [&](IMKCanvas& canvas, Scenes::SceneStage& stage) { DrawScene(scene, canvas, stage); });
+    };
+    Picture const expected = Paint(40, 30, [&](IMKCanvas& canvas, Scenes::SceneStage& stage) {
+        canvas.ClearAll(0, 0, 0.5f, 0.5f);
+        auto const make = [&](std::size_t index, int width, int height) {
+            return RefPtr<IMKBitmap>::Adopt(stage.MakeBitmap(Scenes::MakePicture(index, width, height)));
+        };
+        RefPtr<IMKBitmap> const checker = make(1, 12, 10), photo = make(2, 7, 3);
+        calls(canvas, checker.Get(), photo.Get());
+        canvas.DrawBitmap(checker.Get(), RectF(6, 5, 30, 20), nullptr);
+    });
+    EXPECT_TRUE(paint(operations + ",") == expected);
+    EXPECT_FALSE(paint("") == expected);
 }
 
 std::string FindError(std::string const& text) {
@@ -41,97 +62,176 @@ std::string FindError(std::string const& text) {
     return "no error";
 }
 
-TEST(SceneFormat, OperationsKeepTheirNamesArgumentsAndOrder) {
-    EXPECT_THAT(
-        Play(WithOperations(R"(
-            {"DrawRect": {"rect": [1, 2, 3.5, 4]}},
-            {"DrawRoundRect": {"rect": [1, 2, 3, 4], "rx": 0.5, "ry": 2}},
-            {"DrawCircle": {"cx": 1, "cy": 2, "radius": 3}},
-            {"DrawLine": {"from": [1, 2], "to": [3, 4]}},
-            {"DrawSimpleLine": {"from": [1, 2], "to": [3, 4]}},
-            {"DrawSimpleLines": {"points": [[1, 2], [3, 4], [5, 6], [7, 8]]}},
-            {"Clear": {"color": "#00FF00"}},
-            {"ClearAll": {"color": [0, 0.5, 1, 0.25]}},
-            {"SetClipRect": {"x": -1, "y": 2, "width": 3, "height": 4, "op": "Difference"}},
-            {"SetMatrix": {"matrix": [1, 2, 3, 4, 5, 6, 7, 8, 9]}},
-            {"PostConcat": {"matrix": [1, 0, 0, 0, 1, 0, 0, 0, 1]}},
-            {"PreTranslate": {"tx": 1, "ty": 2}}, {"PostTranslate": {"tx": 1, "ty": 2}},
-            {"PreScale": {"sx": 1, "sy": 2}}, {"PostScale": {"sx": 1, "sy": 2}},
-            {"PreRotate": {"degrees": 9}}, {"PostRotate": {"degrees": 9, "px": 1, "py": 2}})")),
-        ElementsAre("DrawRect [1 2 3.5 4] color(1 1 1 1)", "DrawRoundRect [1 2 3 4] 0.5 2 color(1 1 1 1)",
-                    "DrawCircle 1 2 3 color(1 1 1 1)", "DrawLine (1 2) (3 4) color(1 1 1 1)",
-                    "DrawSimpleLine (1 2) (3 4) color(1 1 1 1)",
-                    "DrawSimpleLines 4: (1 2) (7 8) color(1 1 1 1)", "Clear 0 1 0 1", "ClearAll 0 0.5 1 0.25",
-                    "SetClipRect -1 2 3 4 4", "SetMatrix {1 2 3 4 5 6 7 8 9}",
-                    "PostConcat {1 0 0 0 1 0 0 0 1}", "PreTranslate 1 2", "PostTranslate 1 2", "PreScale 1 2",
-                    "PostScale 1 2", "PreRotate 9", "PostRotate 9 1 2"));
-}
-
-TEST(SceneFormat, BitmapsAreDrawnInTheFormThatTheFieldsSay) {
-    std::string const text = R"({"size": [8, 6],
-        "bitmaps": {"a": {"picture": "checker", "width": 5, "height": 4},
-                    "b": {"picture": "photo", "width": 7, "height": 3}},
-        "operations": [
-            {"DrawBitmap": {"bitmap": "b", "x": 1, "y": 2}},
-            {"DrawBitmap": {"bitmap": "a", "dst": [1, 2, 3, 4]}},
-            {"DrawBitmap": {"bitmap": "a", "src": [0, 1, 2, 3], "dst": [1, 2, 3, 4]}},
-            {"DrawBitmaps": {"bitmap": "a", "points": [[1, 2], [3, 4]]}},
-            {"DrawBitmaps": {"bitmap": "a", "dsts": [[1, 2, 3, 4]]}},
-            {"DrawBitmaps": {"bitmap": "b", "src": [0, 1, 2, 3],
-                "dsts": {"columns": 3, "rows": 2, "from": [10, 20], "step": [5, 7], "size": [4, 6]}}}]})";
-    EXPECT_THAT(Play(text),
-                ElementsAre("DrawBitmap 7x3 1 2 color(1 1 1 1)", "DrawBitmap 5x4 [1 2 3 4] color(1 1 1 1)",
-                            "DrawBitmap 5x4 [0 1 2 3] [1 2 3 4] color(1 1 1 1)",
-                            "DrawBitmaps 5x4 2: (1 2) (3 4) color(1 1 1 1)",
-                            "DrawBitmaps 5x4 1: [1 2 3 4] [1 2 3 4] color(1 1 1 1)",
-                            "DrawBitmaps 7x3 [0 1 2 3] 6: [10 20 14 26] [20 27 24 33] color(1 1 1 1)"));
-}
-
-TEST(SceneFormat, PaintsCarryEveryPropertyAndBuildOnEachOther) {
-    std::string const text = R"({"size": [8, 6],
-        "paints": {
-            "pen": {"color": "#80FF0000", "style": "Stroke", "lineWidth": 2.5, "antiAliasing": true},
-            "dashed": {"base": "pen", "color": [0, 0, 1], "alpha": 0.5, "dashedLinePattern": [4, 2],
-                       "lineCapType": "Square"}},
-        "operations": [
-            {"DrawCircle": {"cx": 1, "cy": 2, "radius": 3, "paint": "dashed"}},
-            {"DrawCircle": {"cx": 1, "cy": 2, "radius": 3, "paint": {"tintColor": "#0000FF",
-                "xfermode": "Lighten", "dashedLinePattern": [1, 2, 3, 4], "lineCapType": 7,
-                "tileMode": ["Mirror", "Repeat"]}}},
-            {"DrawCircle": {"cx": 1, "cy": 2, "radius": 3, "paint": {"base": "pen", "xfermode": 25,
-                "style": "FillAndStroke", "tileMode": "Clamp"}}}]})";
-    EXPECT_THAT(
-        Play(text),
-        ElementsAre("DrawCircle 1 2 3 color(0 0 1 0.5) style2 width2.5 soft dashes(4 2 4 2) cap2",
-                    "DrawCircle 1 2 3 color(1 1 1 1) tint(0 0 1 1) mode17 dashes(1 2 3 4) cap7 tile2,3",
-                    "DrawCircle 1 2 3 color(1 0 0 0.501961) mode25 style1 width2.5 soft tile1,1"));
-}
-
-TEST(SceneFormat, NamesStandForTheLibrarysNumbers) {
-    std::pair<char const*, int> const modes[] = {{"DstOut", MKPaint::DstOut},
-                                                 {"SrcKeepDstAlpha", MKPaint::SrcKeepDstAlpha},
-                                                 {"BlendingOff", MKPaint::BlendingOff}};
-    for (auto const& [name, number] : modes) {
-        std::string const rect = R"({"DrawRect": {"rect": [1, 2, 3, 4], "paint": {"xfermode": ")";
-        EXPECT_THAT(Play(WithOperations(rect + name + "\"}}}")),
-                    ElementsAre(HasSubstr(" mode" + std::to_string(number))));
+TEST(SceneFormat, OperationsAreTheCanvassOwn) {
+    std::pair<char const*, Calls> const cases[] = {
+        {R"({"DrawRect": {"rect": [1, 2, 33.5, 4]}})",
+         [](auto& c, auto*...) { c.DrawRect(1, 2, 33.5f, 4, nullptr); }},
+        {R"({"DrawRoundRect": {"rect": [1, 2, 33, 26], "rx": 3, "ry": 5}})",
+         [](auto& c, auto*...) { c.DrawRoundRect(1, 2, 33, 26, 3, 5, nullptr); }},
+        {R"({"DrawCircle": {"cx": 5, "cy": 6, "radius": 4}})",
+         [](auto& c, auto*...) { c.DrawCircle(5, 6, 4, nullptr); }},
+        {R"({"DrawLine": {"from": [1, 2], "to": [39, 4]}})",
+         [](auto& c, auto*...) { c.DrawLine(1, 2, 39, 4, nullptr); }},
+        {R"({"DrawSimpleLine": {"from": [1, 2], "to": [39, 4]}})",
+         [](auto& c, auto*...) { c.DrawSimpleLine(1, 2, 39, 4, nullptr); }},
+        {R"({"DrawSimpleLines": {"points": [[1, 2], [39, 4], [5, 25], [35, 28]]}})",
+         [](auto& c, auto*...) {
+             c.DrawSimpleLines({{1, 2}, {39, 4}, {5, 25}, {35, 28}}, nullptr);
+         }},
+        {R"({"SetClipRect": {"x": 2, "y": 3, "width": 20, "height": 9}}, {"Clear": {"color": "#00FF00"}})",
+         [](auto& c, auto*...) {
+             c.SetClipRect(2, 3, 20, 9, IMKCanvasBase::Intersect);
+             c.Clear(0, 1, 0, 1);
+         }},
+        {R"({"SetClipRect": {"x": 2, "y": 3, "width": 4, "height": 9}}, {"ClearAll": {"color": [0, 0.5, 1, 0.25]}})",
+         [](auto& c, auto*...) {
+             c.SetClipRect(2, 3, 4, 9, IMKCanvasBase::Intersect);
+             c.ClearAll(0, 0.5f, 1, 0.25f);
+         }},
+        {R"({"SetMatrix": {"matrix": [1, 0.5, 0, 0.25, 2, 0, 7, -8, 1]}})",
+         [](auto& c, auto*...) {
+             c.SetMatrix({1, 0.5f, 0, 0.25f, 2, 0, 7, -8, 1});
+         }},
+        {R"({"PreScale": {"sx": 1.5, "sy": 0.5}}, {"PostConcat": {"matrix": [1, 0, 0, 0.5, 1, 0, 4, 2, 1]}},
+            {"PreTranslate": {"tx": 1, "ty": 2}}, {"PostTranslate": {"tx": -3, "ty": 4}},
+            {"PreRotate": {"degrees": 9}}, {"PreConcat": {"matrix": [1, 0.25, 0, 0, 1, 0, 0, 0, 1]}},
+            {"PostScale": {"sx": 0.75, "sy": 1.25}}, {"PostRotate": {"degrees": -20, "px": 5, "py": 6}})",
+         [](auto& c, auto*...) {
+             c.PreScale(1.5f, 0.5f);
+             c.PostConcat({1, 0, 0, 0.5f, 1, 0, 4, 2, 1});
+             c.PreTranslate(1, 2);
+             c.PostTranslate(-3, 4);
+             c.PreRotate(9);
+             c.PreConcat({1, 0.25f, 0, 0, 1, 0, 0, 0, 1});
+             c.PostScale(0.75f, 1.25f);
+             c.PostRotate(-20, 5, 6);
+         }},
+        {R"({"DrawBitmap": {"bitmap": "photo", "x": 1, "y": 2}})",
+         [](auto& c, auto*, auto* photo) { c.DrawBitmap(photo, 1, 2, nullptr); }},
+        {R"({"DrawBitmap": {"bitmap": "photo", "dst": [1, 2, 30, 4]}})",
+         [](auto& c, auto*, auto* photo) { c.DrawBitmap(photo, RectF(1, 2, 30, 4), nullptr); }},
+        {R"({"DrawBitmap": {"bitmap": "checker", "src": [0, 1, 2, 3], "dst": [1, 2, 30, 24]}})",
+         [](auto& c, auto* b, auto*) { c.DrawBitmap(b, RectF(0, 1, 2, 3), RectF(1, 2, 30, 24), nullptr); }},
+        {R"({"DrawBitmaps": {"bitmap": "photo", "points": [[1, 2], [30, 20]]}})",
+         [](auto& c, auto*, auto* photo) {
+             std::vector<PointF> points{{1, 2}, {30, 20}};
+             c.DrawBitmaps(photo, points, nullptr);
+         }},
+        {R"({"DrawBitmaps": {"bitmap": "photo", "dsts": [[1, 2, 30, 4]]}})",
+         [](auto& c, auto*, auto* photo) { c.DrawBitmaps(photo, {RectF(1, 2, 30, 4)}, nullptr); }},
+        {R"({"DrawBitmaps": {"bitmap": "checker", "src": [1, 0, 12, 10], "paint": {"alpha": 0.5},
+                "dsts": {"columns": 3, "rows": 2, "from": [1, 14], "step": [9, 4], "size": [20, 9]}}})",
+         [](auto& c, auto* b, auto*) {
+             std::vector<RectF> dsts; // row by row; they show through each other
+             MKPaint half;
+             half.SetAlpha(0.5f);
+             for (int i = 0; i < 6; ++i) {
+                 int const column = i % 3, row = i / 3;
+                 auto const x = static_cast<float>(1 + 9 * column), y = static_cast<float>(14 + 4 * row);
+                 dsts.emplace_back(x, y, x + 20, y + 9);
+             }
+             c.DrawBitmaps(b, RectF(1, 0, 12, 10), dsts, &half);
+         }},
+    };
+    for (auto const& [operations, calls] : cases) ExpectDraws(operations, calls);
+    std::pair<char const*, IMKCanvasBase::ClipOp> const ops[] = {
+        {"Replace", IMKCanvasBase::Replace},
+        {"Union", IMKCanvasBase::Union},
+        {"Xor", IMKCanvasBase::Xor},
+        {"Difference", IMKCanvasBase::Difference},
+        {"ReverseDifference", IMKCanvasBase::ReverseDifference}};
+    for (auto const& pair : ops) {
+        std::string const clip = R"({"SetClipRect": {"x": 2, "y": 3, "width": 20, "height": 9}},
+            {"SetClipRect": {"x": 15, "y": 8, "width": 20, "height": 9, "op": ")";
+        ExpectDraws(clip + pair.first + "\"}}", [op = pair.second](auto& c, auto*...) {
+            c.SetClipRect(2, 3, 20, 9, IMKCanvasBase::Intersect);
+            c.SetClipRect(15, 8, 20, 9, op);
+        });
     }
 }
 
+TEST(SceneFormat, PaintsCarryEveryPropertyAndBuildOnEachOther) {
+    std::string const paints = R"(
+        "pen": {"color": "#80FF0000", "style": "Stroke", "lineWidth": 2.5, "antiAliasing": true},
+        "dashed": {"base": "pen", "color": [0, 0, 1], "alpha": 0.5, "dashedLinePattern": [4, 2],
+                   "lineCapType": "Square"})";
+    MKPaint pen;
+    pen.SetColor(static_cast<int>(0x80FF0000));
+    pen.SetStyle(MKPaint::Stroke);
+    pen.SetLineWidth(2.5f);
+    pen.SetAntiAliasing(true);
+    MKPaint dashed = pen;
+    dashed.SetColor(0, 0, 1);
+    dashed.SetAlpha(0.5f);
+    dashed.SetDashedLinePattern({4, 2, 4, 2});
+    dashed.SetLineCapType(MKPaint::Square);
+    ExpectDraws(R"({"DrawLine": {"from": [3, 3], "to": [35, 25], "paint": "dashed"}})",
+                [&](auto& c, auto*...) { c.DrawLine(3, 3, 35, 25, &dashed); }, paints);
+    dashed.SetDashedLinePattern({1, 2, 3, 4});
+    ExpectDraws(
+        R"({"DrawLine": {"from": [3, 3], "to": [35, 25],
+                         "paint": {"base": "dashed", "dashedLinePattern": [1, 2, 3, 4]}}})",
+        [&](auto& c, auto*...) { c.DrawLine(3, 3, 35, 25, &dashed); }, paints);
+    pen.SetStyle(MKPaint::FillAndStroke);
+    pen.SetAlpha(0.25f); // in the place of the colour's
+    ExpectDraws(
+        R"({"DrawCircle": {"cx": 11, "cy": 12, "radius": 9, "paint": {"base": "pen", "style": "FillAndStroke", "alpha": 0.25}}})",
+        [&](auto& c, auto*...) { c.DrawCircle(11, 12, 9, &pen); }, paints);
+    MKPaint tinted;
+    tinted.SetTintColor(static_cast<int>(0x8000FF00));
+    tinted.SetXFermode(MKPaint::DstOut);
+    ExpectDraws(
+        R"({"DrawBitmap": {"bitmap": "checker", "dst": [1, 2, 38, 29],
+                           "paint": {"tintColor": "#8000FF00", "xfermode": "DstOut"}}})",
+        [&](auto& c, auto* b, auto*) { c.DrawBitmap(b, RectF(1, 2, 38, 29), &tinted); });
+    MKPaint tiled;
+    tiled.SetTileMode(MKPaint::Mirror, MKPaint::Repeat);
+    ExpectDraws(
+        R"({"DrawBitmap": {"bitmap": "checker", "src": [0, 0, 30, 40], "dst": [1, 2, 38, 29],
+                           "paint": {"tileMode": ["Mirror", "Repeat"]}}})",
+        [&](auto& c, auto* b, auto*) { c.DrawBitmap(b, RectF(0, 0, 30, 40), RectF(1, 2, 38, 29), &tiled); });
+    MKPaint numbered;
+    numbered.SetXFermode(MKPaint::SrcKeepDstAlpha);
+    numbered.SetTileMode(MKPaint::Clamp, MKPaint::Clamp);
+    std::string const number = std::to_string(MKPaint::SrcKeepDstAlpha);
+    for (std::string const& mode : {number, std::string("\"SrcKeepDstAlpha\"")})
+        ExpectDraws(R"({"DrawBitmap": {"bitmap": "checker", "src": [0, 0, 30, 40], "dst": [1, 2, 38, 29],
+                         "paint": {"tileMode": "Clamp", "xfermode": )" +
+                        mode + "}}}",
+                    [&](auto& c, auto* b, auto*) {
+                        c.DrawBitmap(b, RectF(0, 0, 30, 40), RectF(1, 2, 38, 29), &numbered);
+                    });
+}
+
 TEST(SceneFormat, GroupsArePlacedClippedRepeatedAndLeaveNothingBehind) {
-    EXPECT_THAT(
-        Play(WithOperations(R"(
-                    {"Group": {"scale": [2, 3], "clip": [1, 2, 3, 4], "rotate": 45, "translate": [5, 6],
-                        "matrix": [1, 0, 0, 0, 1, 0, 7, 8, 1],
-                        "operations": [{"PreScale": {"sx": 4, "sy": 4}}]}},
-                    {"Group": {"repeat": {"count": 3, "translate": [10, 0], "rotate": 5},
-                        "operations": [{"PreScale": {"sx": 2, "sy": 2}}, {"Save": {}}]}})")),
-        ElementsAre("Save 0", "PreTranslate 5 6", "PreRotate 45", "PreScale 2 3",
-                    "PreConcat {1 0 0 0 1 0 7 8 1}", "SetClipRect 1 2 3 4 0", "PreScale 4 4", "Restore 0",
-                    // Each repetition begins where the one before began, one step further.
-                    "Save 0", "Save 0", "PreScale 2 2", "Save 0", "Restore 1", "PreTranslate 10 0",
-                    "PreRotate 5", "Save 0", "PreScale 2 2", "Save 0", "Restore 1", "PreTranslate 10 0",
-                    "PreRotate 5", "Save 0", "PreScale 2 2", "Save 0", "Restore 1", "Restore 0"));
+    ExpectDraws(
+        R"({"Group": {"scale": [2, 3], "clip": [1, 2, 13, 4], "rotate": 15, "translate": [5, 6],
+                "matrix": [1, 0, 0, 0, 1, 0, 2, 1, 1],
+                "operations": [{"PreScale": {"sx": 4, "sy": 4}}, {"DrawRect": {"rect": [0, 0, 2, 1]}}]}},
+            {"Group": {"repeat": {"count": 3, "translate": [10, 0], "rotate": 5},
+                "operations": [{"PreScale": {"sx": 2, "sy": 2}}, {"Save": {}}, {"DrawRect": {"rect": [1, 9, 3, 12]}}]}})",
+        [](auto& c, auto*...) {
+            int level = c.Save(IMKCanvasBase::SaveAll);
+            c.PreTranslate(5, 6);
+            c.PreRotate(15);
+            c.PreScale(2, 3);
+            c.PreConcat({1, 0, 0, 0, 1, 0, 2, 1, 1});
+            c.SetClipRect(1, 2, 13, 4, IMKCanvasBase::Intersect);
+            c.PreScale(4, 4);
+            c.DrawRect(0, 0, 2, 1, nullptr);
+            c.Restore(level);
+            for (int i = 0; i < 3; ++i) {
+                level = c.Save(IMKCanvasBase::SaveAll);
+                // Each repetition begins where the one before began, one step further.
+                for (int step = 0; step < i; ++step) {
+                    c.PreTranslate(10, 0);
+                    c.PreRotate(5);
+                }
+                c.PreScale(2, 2);
+                c.DrawRect(1, 9, 3, 12, nullptr);
+                c.Restore(level);
+            }
+        });
 }
 
 TEST(SceneFormat, SizeAndBackgroundAreTheScenes) {
@@ -272,10 +372,11 @@ TEST(SceneFormat, ABitmapThatCannotBeMadeDrawsNothing) {
         "bitmaps": {"a": {"picture": "photo", "width": 5, "height": 4}},
         "operations": [{"DrawBitmap": {"bitmap": "a", "x": 1, "y": 2}}]})",
                                    "test", "");
-    EmptyStage stage;
-    RefPtr<CanvasLog> const canvas = RefPtr<CanvasLog>::Adopt(new CanvasLog);
-    EXPECT_THROW(DrawScene(scene, *canvas, stage), SceneError);
-    EXPECT_THAT(canvas->GetLines(), ElementsAre(StartsWith("ClearAll")));
+    Picture const painted = Paint(8, 6, [&](IMKCanvas& canvas, Scenes::SceneStage&) {
+        EmptyStage noRoom;
+        EXPECT_THROW(DrawScene(scene, canvas, noRoom), SceneError);
+    });
+    EXPECT_TRUE(painted == Picture(8, 6));
 }
 
 } // namespace
