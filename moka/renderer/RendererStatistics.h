@@ -23,6 +23,33 @@ enum class RunEnd {
 };
 inline constexpr std::size_t kRunEnds = 10;
 
+// One lower-case word.
+constexpr char const* GetName(RunEnd end) {
+    switch (end) {
+    case RunEnd::Program:
+        return "program";
+    case RunEnd::Texture:
+        return "texture";
+    case RunEnd::Blend:
+        return "blend";
+    case RunEnd::Scissor:
+        return "scissor";
+    case RunEnd::Clip:
+        return "clip";
+    case RunEnd::Target:
+        return "target";
+    case RunEnd::Primitive:
+        return "primitive";
+    case RunEnd::Values:
+        return "values";
+    case RunEnd::Full:
+        return "full";
+    case RunEnd::Other:
+        break;
+    }
+    return "other";
+}
+
 struct RendererStatistics {
     int textures = 0; // storages, not views
     int samplers = 0;
