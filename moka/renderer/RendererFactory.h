@@ -94,8 +94,9 @@ public:
 
     // Before foreign GL: everything asked for so far has reached GL. The host's frame buffers, viewport,
     // vertex array, culling, depth test and dither are as they were, pixel store holds GL's defaults, no
-    // sampler is bound. Scissor, blend, stencil and masks are as last set or applied here; texture bindings
-    // and the program are not given back. An active target stays the active one.
+    // sampler is bound. The vertex and uniform buffers that the host had bound are bound again. Scissor, blend,
+    // stencil and masks are as last set or applied here. Not given back: texture bindings, the program, and
+    // uniform buffer binding point 23, which a host should not use. An active target stays the active one.
     static void Flush();
     // Before foreign GL that draws into the active target: everything asked for so far has reached GL, the
     // target is bound, and viewport, scissor, blend, stencil, masks, program and textures are as last set or
