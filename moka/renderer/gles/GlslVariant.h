@@ -22,7 +22,7 @@ inline constexpr char kRecordBlock[] = "MokaRecords";
 // Of the vertices' numbers; the last one that every device has.
 inline constexpr unsigned kRecordLocation = 15;
 // Bytes of the block that every device has room for.
-inline constexpr std::size_t kBlockBytes = 16 * 1024;
+inline constexpr std::size_t kBlockBytes = std::size_t{16} * 1024;
 // Vectors from stage to stage that every device has room for.
 inline constexpr int kMostVaryings = 15;
 
