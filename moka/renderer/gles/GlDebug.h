@@ -25,12 +25,12 @@ public:
     // identifier: GL_TEXTURE and so on. Longer labels than the driver takes are cut.
     void Label(GLenum identifier, GLuint name, char const* text) const;
 
-    // Debug output was enabled when the context was attached. Without it groups would cost and nobody would see them.
+    // True if the driver has groups and debug output was enabled when the context was attached.
     bool HasGroups() const { return mPushGroup != nullptr; }
 
-    // Takes the pending GL errors; false when there were any since the last check. They are logged with what was being done, and
-    // counted, unless the driver's own message has been already. For places where the call costs nothing
-    // beside the work, never for a draw.
+    // Takes the pending GL errors; false when there were any since the last check. They are logged with the
+    // operation, and counted, unless the driver's own message has been already. For places where the call
+    // costs nothing beside the work, never for a draw.
     bool Check(char const* doing);
     // The same after one call, in debug builds; see GlFunctions.h.
     void CheckCall(char const* call);
