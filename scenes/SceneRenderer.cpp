@@ -54,7 +54,8 @@ IMKBitmap* QueueStage::MakeBitmap(Picture const& picture) {
     return bitmap;
 }
 
-Picture RenderScene(Scene const& scene, IGLMsgQueue& queue, ScenePen* pen) {
+Picture RenderScene(Scene const& scene, IGLMsgQueue& queue, ScenePen* pen,
+                    std::function<void()> const& onDrawn) {
     RefPtr<IMKBitmap> const target = MakeTarget(scene, queue);
     CheckStrips(scene, *target, queue);
     auto const canvas = NewCanvas(queue, target);
@@ -63,6 +64,7 @@ Picture RenderScene(Scene const& scene, IGLMsgQueue& queue, ScenePen* pen) {
     DrawScene(scene, *canvas, stage);
     Picture picture(scene.width, scene.height);
     target->GetBitmapData(target->GetBitmapRect(), picture.pixels.data());
+    if (onDrawn) onDrawn();
     if (scene.onScreen) FlipRows(picture);
     return picture;
 }

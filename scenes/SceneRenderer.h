@@ -5,6 +5,8 @@
 #include "scenes/Picture.h"
 #include "scenes/Scene.h"
 
+#include <functional>
+
 namespace Moka::Scenes {
 
 // Bitmaps on the GPU, for canvases on any thread but the render thread.
@@ -22,8 +24,10 @@ private:
     ScenePen* const mPen;
 };
 
-// A scene for the screen is drawn on the default frame buffer, which has to be as large as the scene.
+// A scene for the screen is drawn on the default frame buffer, which has to be as large as the scene. onDrawn
+// is called after the last draw, while the canvas and its programs exist.
 // Fails: throws SceneError when there is no room for the target or a bitmap.
-Picture RenderScene(Scene const& scene, IGLMsgQueue& queue, ScenePen* pen = nullptr);
+Picture RenderScene(Scene const& scene, IGLMsgQueue& queue, ScenePen* pen = nullptr,
+                    std::function<void()> const& onDrawn = {});
 
 } // namespace Moka::Scenes

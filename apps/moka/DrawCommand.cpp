@@ -15,6 +15,7 @@
 
 #include <CLI/CLI.hpp>
 #include <cerrno>
+#include <cstdint>
 #include <cstdio>
 #include <cstring>
 #include <memory>
@@ -38,6 +39,7 @@ struct DrawOptions {
     std::string output;
     std::string format; // of standard output
     std::string trace;  // empty for none
+    bool statistics = false;
     bool watch = false;
     bool verbose = false;
 };
@@ -69,18 +71,34 @@ private:
     std::string mError;
 };
 
+void PrintStatistics(RendererStatistics const& statistics) {
+    auto const print = [](char const* what, std::uint64_t count) {
+        std::printf("%s: %llu\n", what, static_cast<unsigned long long>(count));
+    };
+    print("draws requested", statistics.drawRequests);
+    print("runs", statistics.runs);
+    print("draw calls", statistics.draws);
+    print("records", statistics.records);
+    print("variants", static_cast<std::uint64_t>(statistics.variants));
+    for (std::size_t i = 0; i < kRunEnds; ++i) {
+        std::string const what = std::string("end of run, ") + GetName(static_cast<RunEnd>(i));
+        if (statistics.runEnds[i] != 0) print(what.c_str(), statistics.runEnds[i]);
+    }
+}
+
 // Draws once, on a render thread of its own.
 void Draw(DrawOptions const& options, Interruption& interruption) {
     DrawTrace trace(options.trace);
     OutputFile output(options.output, options.format.empty() ? "png" : options.format);
     Scenes::Picture picture;
+    RendererStatistics statistics;
     {
         LogCollector log(options.verbose);
         Progress progress(options.verbose ? Progress::Verbose : Progress::Line);
         progress.SetStage("read the scene");
         Scenes::Scene const scene = Load(options.input);
         progress.SetStage("draw");
-        picture = DrawOnGpu(scene, *StartForScene({}, log), log);
+        picture = DrawOnGpu(scene, *StartForScene({}, log), log, statistics);
         progress.SetStage("encode");
         SavePicture(picture, output, interruption);
     }
@@ -88,6 +106,7 @@ void Draw(DrawOptions const& options, Interruption& interruption) {
     if (!output.IsStream()) {
         std::printf("%s -> %s (%dx%d)\n", MakePrintable(options.input).c_str(),
                     MakePrintable(options.output).c_str(), picture.width, picture.height);
+        if (options.statistics) PrintStatistics(statistics);
         std::fflush(stdout); // whoever watches sees it at once
     }
     trace.Finish();
@@ -113,6 +132,9 @@ void RunDraw(DrawOptions const& options) {
         throw Failure(ExitStatus::Usage, "the trace and the picture cannot both be " + options.output);
     if (IsStandardStream(options.trace))
         throw Failure(ExitStatus::Usage, "--trace needs the name of a file; - is none");
+    if (options.statistics && IsStandardStream(options.output))
+        throw Failure(ExitStatus::Usage,
+                      "--statistics prints to standard output, where -o - sends the picture; name a file");
     bool const isStream = IsStandardStream(options.input) || IsStandardStream(options.output);
     if (options.watch && isStream)
         throw Failure(ExitStatus::Usage, "--watch needs the names of two files; - is none");
@@ -143,6 +165,9 @@ void AddDrawCommand(CLI::App& app) {
     command->add_option("--to", options->format, "The format of standard output; png unless given")
         ->type_name("FORMAT")
         ->check(CLI::Validator(CheckFormat, ""));
+    command->add_flag("--statistics", options->statistics,
+                      "Print how many draws were requested, how they merged into draw calls, and what "
+                      "kept them apart");
     command->add_flag("-w,--watch", options->watch,
                       "Draw again whenever the scene's file changes, until interrupted");
     command

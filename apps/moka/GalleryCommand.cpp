@@ -9,6 +9,7 @@
 #include "apps/moka/SceneDrawing.h"
 #include "apps/moka/StandardStreams.h"
 #include "apps/moka/Text.h"
+#include "moka/renderer/RendererFactory.h"
 
 #include <CLI/CLI.hpp>
 #include <algorithm>
@@ -87,7 +88,7 @@ bool IsSameTarget(RenderThreadOptions const& a, RenderThreadOptions const& b) {
 void DrawAll(Gallery& gallery, LogCollector& log, Progress& progress) {
     std::unique_ptr<RenderThread> queue;
     RenderThreadOptions current;
-    for (GalleryPicture const& picture : gallery.pictures) {
+    for (GalleryPicture& picture : gallery.pictures) {
         progress.SetStage(picture.scene->name.c_str());
         RenderThreadOptions const options = OptionsFor(picture);
         if (!queue || !IsSameTarget(options, current)) {
@@ -95,7 +96,11 @@ void DrawAll(Gallery& gallery, LogCollector& log, Progress& progress) {
             queue = StartForScene(options, log);
             current = options;
         }
-        gallery.pixels.push_back(DrawOnGpu(*picture.scene, *queue, log));
+        RendererStatistics const before = RendererFactory::GetStatistics();
+        RendererStatistics after;
+        gallery.pixels.push_back(DrawOnGpu(*picture.scene, *queue, log, after));
+        picture.drawRequests = after.drawRequests - before.drawRequests;
+        picture.drawCalls = after.draws - before.draws;
         gallery.device = queue->GetContextInfo().renderer;
     }
 }

@@ -83,7 +83,8 @@ std::string MakeFigure(GalleryPicture const& picture) {
            "\" height=\"" + std::to_string(scene.height * zoom) + "\" alt=\"" + about +
            "\">\n<figcaption><b>" + name + "</b> " + std::to_string(scene.width) + " x " +
            std::to_string(scene.height) + (isSmall ? ", enlarged" : "") + "<br>" + about +
-           "</figcaption></figure>\n";
+           "<br>draws requested: " + std::to_string(picture.drawRequests) +
+           ", draw calls: " + std::to_string(picture.drawCalls) + "</figcaption></figure>\n";
 }
 
 } // namespace

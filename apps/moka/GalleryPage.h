@@ -3,6 +3,7 @@
 
 #include "scenes/Scene.h"
 
+#include <cstdint>
 #include <string>
 #include <vector>
 
@@ -11,6 +12,8 @@ namespace Moka::Tool {
 struct GalleryPicture {
     Scenes::Scene const* scene;
     bool isInStrips;
+    std::uint64_t drawRequests = 0;
+    std::uint64_t drawCalls = 0;
 
     // Of the picture and, with ".png", of its file.
     std::string GetName() const { return scene->name + (isInStrips ? "-in-strips" : ""); }

@@ -9,6 +9,7 @@
 #include "moka/base/Bitmap.h"
 #include "moka/base/BitmapFactory.h"
 #include "moka/base/String.h"
+#include "moka/renderer/RendererFactory.h"
 #include "scenes/SceneError.h"
 
 #include <string>
@@ -24,14 +25,16 @@ std::unique_ptr<RenderThread> StartForScene(RenderThreadOptions const& options, 
     return queue;
 }
 
-Scenes::Picture DrawOnGpu(Scenes::Scene const& scene, RenderThread& queue, LogCollector const& log) {
+Scenes::Picture DrawOnGpu(Scenes::Scene const& scene, RenderThread& queue, LogCollector const& log,
+                          RendererStatistics& statistics) {
     int const largest = queue.GetContextInfo().maxTextureSize;
     if (scene.width > largest)
         throw Failure(scene.name + " is " + std::to_string(scene.width) +
                       " pixels wide; this device takes textures up to " + std::to_string(largest));
     try {
         PenStroke pen(queue);
-        Scenes::Picture picture = RenderScene(scene, queue, &pen);
+        Scenes::Picture picture =
+            RenderScene(scene, queue, &pen, [&] { statistics = RendererFactory::GetStatistics(); });
         std::string const error = log.GetError();
         if (error.empty()) return picture;
         throw Failure(scene.name + ": " + error);

@@ -13,12 +13,13 @@ _moka() {
         --out) _filedir -d; return ;;
         --only) mapfile -t COMPREPLY < <(compgen -W "$(moka gallery --list 2>/dev/null | awk '{print $1}')" -- "$cur"); return ;;
         -o) _filedir "$images"; return ;;
+        --trace) _filedir; return ;;
         --jobs | --quality | --size | --max-texture) return ;;
     esac
     local options=
     case $command in
         convert) options="--help --to --out --jobs --quality --size --max-texture --quiet --verbose" ;;
-        draw) options="--help -o --to --watch --verbose" ;;
+        draw) options="--help -o --to --statistics --trace --watch --verbose" ;;
         gallery) options="--help --out --only --mki --list" ;;
         info) options="--help --device --verbose" ;;
         *) return ;;

@@ -1,6 +1,6 @@
 // DepthStencilStateDescriptor: the depth and stencil tests of both faces, as a value.
-// A new one with the stencil on passes always and keeps what is there. The depth test, where it is on, passes
-// what is nearer and writes it.
+// A new one with the stencil on always passes and keeps the stored value. The depth test, if on, passes nearer
+// fragments and writes their depth.
 #pragma once
 
 namespace Moka {
@@ -20,7 +20,7 @@ class DepthStencilStateDescriptor {
 public:
     DepthStencilStateDescriptor(bool depth, bool stencil) : mDepth(depth), mStencil(stencil) {}
 
-    // Passes where (reference & readMask) compares to (what is there & readMask); writeMask says which bits
+    // Passes where (reference & readMask) compares to (stored value & readMask); writeMask says which bits
     // an operation may change.
     void SetStencilFunction(StencilComparison comparison, int reference, unsigned readMask,
                             unsigned writeMask) {

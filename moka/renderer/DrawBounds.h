@@ -1,4 +1,4 @@
-// DrawBounds: a box on the target that encloses what a draw covers.
+// DrawBounds: a box on the target that encloses all pixels that a draw covers.
 // Units: normalized device coordinates: -1 to 1 over the target, as gl_Position.xy / gl_Position.w has them.
 // An empty box, which a default one is, says that nothing is known.
 #pragma once

@@ -1,5 +1,5 @@
 // IBlendStateObject: a blend state that can be put in force.
-// Owner:  whoever created it, until Release(), which leaves what was applied in force.
+// Owner:  whoever created it, until Release(), which keeps an applied state in force.
 // Thread: render thread.
 #pragma once
 

@@ -1,8 +1,8 @@
 // IGraphicsObject: vertices of one layout, and the drawing of them.
 // Owner:  whoever created it, until Release().
 // Thread: render thread.
-// What a draw is made of (target, scissor, blend and depth-stencil state, program and its parameters,
-// textures, vertices) is taken down when it is asked for; changing any of it afterwards does not reach it.
+// Draw records target, scissor, blend and depth-stencil state, program and its parameters, textures and
+// vertices by value: later changes of them do not reach the draw.
 #pragma once
 
 #include "moka/renderer/DrawBounds.h"
@@ -18,15 +18,15 @@ public:
     // no vertices behind.
     virtual void SetVertices(int stream, void const* data, int count) = 0;
 
-    // Draws count vertices from the first one on, all that are left with -1; what is not there is not drawn.
-    // Drawing nothing is legal. False when nothing can be drawn: no program that compiled is current, the
-    // context is gone, or instances is not 1 (one log line).
+    // Draws count vertices from the first one on, all that are left with -1. A range beyond the last vertex
+    // is cut. Drawing nothing is legal. False when nothing can be drawn: no program that compiled is current,
+    // the context is gone, or instances is not 1 (one log line).
     virtual bool Draw(int first, int count, int instances) = 0;
 
     virtual void Release() = 0;
 
-    // Encloses all that draws of the present vertices cover, whatever their program does. Lets them join earlier
-    // draws that they do not touch. Handing vertices over forgets it.
+    // The box must enclose all pixels that draws of the present vertices cover. Such draws may join earlier
+    // draws of their state, ahead of others that they do not touch. SetVertices forgets the box.
     virtual void SetBounds(DrawBounds const&) {}
 
 protected:

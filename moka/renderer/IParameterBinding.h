@@ -23,9 +23,9 @@ enum BindingType {
 
 class IParameterBinding {
 public:
-    // value points to one value of the type; it is copied. Uniforms belong to their program: what is set
-    // while another one is current is in force once this one is. A value equal to the last one costs no call
-    // of the driver.
+    // value points to one value of the type; it is copied. Uniforms belong to their program: a value that
+    // is set while another program is current takes effect when this one is. A value equal to the last one
+    // costs no call of the driver.
     virtual void Set(void const* value) = 0;
     virtual ~IParameterBinding() = default;
 

@@ -1,9 +1,9 @@
-// IRasterizerState: the scissor test: what lies outside the rectangle is neither drawn nor cleared.
+// IRasterizerState: the scissor test: pixels outside the rectangle are neither drawn nor cleared.
 // Owner:  the renderer; there is one.
 // Thread: render thread.
 // Units:  pixels of the target, origin at its first row and column: the bottom left of a host's frame buffer,
 //         the first texel of an off-screen target.
-// What is asked for is answered from memory; GL is asked once when foreign code may have changed it.
+// Queries are answered from memory; GL is asked once when external GL may have changed the state.
 #pragma once
 
 namespace Moka {

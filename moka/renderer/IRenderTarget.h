@@ -18,12 +18,12 @@ public:
     // target does nothing. Leaves scissor, stencil, blend and masks alone.
     virtual void Activate() = 0;
 
-    // Ends drawing; foreign code then finds the frame buffer that was bound before the first activation, and
+    // Ends drawing; external GL then finds the frame buffer that was bound before the first activation, and
     // its viewport (while deferred, only after RendererFactory::Flush). Does nothing for a target that is not
     // the active one. The flags let the driver drop the colour, and the depth and stencil contents.
     virtual void Deactivate(bool discardColor, bool discardDepthStencil) = 0;
 
-    // Reads a block; what lies outside the target is skipped and leaves the destination untouched. Rows that
+    // Reads a block. Pixels outside the target are skipped; the destination keeps its bytes there. Rows that
     // would overlap in the destination are refused with a log line.
     virtual void ReadPixels(int x, int y, int width, int height, PixelDestination const& destination) = 0;
 

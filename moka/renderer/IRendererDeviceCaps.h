@@ -1,5 +1,5 @@
-// IRendererDeviceCaps: what the device can do, read once when the render thread's context is made.
-// Thread: any, without GL. Before a context exists it answers with what every OpenGL ES 3.0 device offers.
+// IRendererDeviceCaps: the device's capabilities, read once when the render thread's context is made.
+// Thread: any, without GL. Before a context exists it answers with the minimum of OpenGL ES 3.0.
 // GetMaxTextureSize stands right behind the destructor; that place is part of the contract.
 #pragma once
 

@@ -12,7 +12,7 @@ class IParameterBinding;
 
 class IShaderProgram {
 public:
-    // What is drawn from here on is drawn with it.
+    // Later draws use this program.
     virtual void MakeCurrent() = 0;
 
     virtual void Release() = 0;

@@ -25,8 +25,8 @@ public:
     // stride shorter than a row is refused with a log line.
     virtual void Replace(void const* pixels, int stride) = 0;
 
-    // Replaces the texels of rect; pixels addresses rect's first pixel. What lies outside the texture is
-    // skipped, the rest of the source still lands where it belongs.
+    // Replaces the texels of rect; pixels addresses rect's first pixel. Source
+    // pixels outside the texture are skipped; the others keep their places.
     virtual void Replace(Rect const& rect, void const* pixels, int stride) = 0;
 
     // Copies itself texel for texel into the current frame buffer's lower left corner, whatever blend,

@@ -24,7 +24,7 @@ class IRenderTarget;
 class IShaderProgram;
 class ITextureObject;
 
-// Lowers what the device offers, so that the cutting of tall images can be seen with small ones.
+// Lowers the device's limits, so that tests see tall images cut with small ones.
 struct RendererLimits {
     int maxTextureSize = 0;  // texels; 0 keeps the device's own
     bool mergesDraws = true; // false: only draws of equal state and values become one draw call
@@ -82,26 +82,27 @@ public:
     // Never null; not to be released.
     static IRasterizerState* GetRasterizerState();
 
-    // While on, the stencil test in force is a clip that what is drawn must not switch off: applying a state
-    // without a stencil test leaves it alone, and clearing the colour fills through it.
+    // While on, the current stencil test is a clip, which draws cannot switch off: applying a state without a
+    // stencil test keeps it, and clearing the colour fills through it.
     static void SetStencilClip(bool on);
 
-    // Off until switched on. Immediate: everything asked for between an activation and its deactivation
-    // reaches GL at the deactivation, and the host gets its frame buffer back there. Deferred: when somebody
-    // could see the difference, at the latest in Flush(); a host switches it on when it calls Flush()
-    // whenever its queue runs empty.
+    // Off until switched on. Immediate: all requests between an activation and its deactivation reach GL at
+    // the deactivation, and the host gets its frame buffer back there. Deferred: they reach GL when somebody
+    // could see the difference, at the latest in Flush(). A host that calls Flush() whenever its queue runs
+    // empty switches it on.
     static void SetDeferred(bool on);
 
-    // Before foreign GL: everything asked for so far has reached GL. The host's frame buffers, viewport,
+    // Before external GL: submits all requests so far. The host's frame buffers, viewport,
     // vertex array, culling, depth test and dither are as they were, pixel store holds GL's defaults, no
-    // sampler is bound. Scissor, blend, stencil and masks are as last set or applied here; texture bindings
-    // and the program are not given back. An active target stays the active one.
+    // sampler is bound. The vertex and uniform buffers that the host had bound are bound again. Scissor, blend,
+    // stencil and masks are as last set or applied here. Not given back: texture bindings, the program, and
+    // uniform buffer binding point 23, which a host should not use. An active target stays the active one.
     static void Flush();
-    // Before foreign GL that draws into the active target: everything asked for so far has reached GL, the
+    // Before external GL that draws into the active target: submits all requests so far. Then the
     // target is bound, and viewport, scissor, blend, stencil, masks, program and textures are as last set or
     // applied here. Until InvalidateState() every operation reaches GL at once.
     static void Commit();
-    // After foreign GL: forgets what the renderer believed the GL state to be.
+    // After external GL: drops the cached GL state.
     static void InvalidateState();
 
     // Any thread: a snapshot.

@@ -1,6 +1,5 @@
-// RendererStatistics: what the renderer holds and what it has done since the context was attached.
-// Objects are live ones, by kind; a test that ends with any of them but the pooled ones above zero has
-// found a leak.
+// RendererStatistics: the renderer's live objects, and counts of its work since the context was attached.
+// Objects are counted by kind. If any but the pooled ones are left when a test ends, the test has found a leak.
 #pragma once
 
 #include <array>
@@ -22,6 +21,33 @@ enum class RunEnd {
     Other,     // a clear, a copy or a flush lies between
 };
 inline constexpr std::size_t kRunEnds = 10;
+
+// One lower-case word.
+constexpr char const* GetName(RunEnd end) {
+    switch (end) {
+    case RunEnd::Program:
+        return "program";
+    case RunEnd::Texture:
+        return "texture";
+    case RunEnd::Blend:
+        return "blend";
+    case RunEnd::Scissor:
+        return "scissor";
+    case RunEnd::Clip:
+        return "clip";
+    case RunEnd::Target:
+        return "target";
+    case RunEnd::Primitive:
+        return "primitive";
+    case RunEnd::Values:
+        return "values";
+    case RunEnd::Full:
+        return "full";
+    case RunEnd::Other:
+        break;
+    }
+    return "other";
+}
 
 struct RendererStatistics {
     int textures = 0; // storages, not views
@@ -47,7 +73,7 @@ struct RendererStatistics {
     std::uint64_t flushes = 0;                     // of the draw list
     std::uint64_t listBytes = 0;                   // memory that the draw list holds
 
-    // Calls that change what the driver has.
+    // Calls that change the driver's state.
     std::uint64_t frameBufferSwitches = 0;
     std::uint64_t programSwitches = 0;
     std::uint64_t uniformChanges = 0;

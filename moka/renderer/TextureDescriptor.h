@@ -1,4 +1,4 @@
-// TextureDescriptor: what a texture is made of, as a value.
+// TextureDescriptor: size and format of a texture, as a value.
 // Made from a model, it describes the same storage: the texture created from it shows the model's image, and
 // the storage lives until the last texture over it is deleted. Sampling state is each texture's own.
 #pragma once

@@ -1,4 +1,4 @@
-// VertexDescriptor: what one vertex is made of, as a value: attributes in the order in which the vertex stage
+// VertexDescriptor: the layout of one vertex, as a value: attributes in the order in which the vertex stage
 // declares them, tightly packed.
 #pragma once
 

@@ -92,6 +92,20 @@ TEST_F(DrawTest, AMistakeIsNamedWithItsPlaceAndNothingIsWritten) {
     ExpectFails({"draw", "-o", "new.png"}, kUsage, {"SCENE", "moka draw --help"});
 }
 
+// 40 rectangles merge, whatever their matrices; the circle touches them, and the next rectangle the circle; the
+// last one has a clip. Each run is one draw call.
+TEST_F(DrawTest, StatisticsTellWhatMergedAndWhatDidNot) {
+    WriteFile("s.json", R"({"size": [64, 64], "operations": [
+        {"Group": {"repeat": {"count": 40, "translate": [1, 1]}, "operations": [{"DrawRect": {"rect": [0, 0, 9, 9]}}]}},
+        {"DrawCircle": {"cx": 20, "cy": 20, "radius": 8}},
+        {"DrawRect": {"rect": [20, 20, 40, 40]}},
+        {"Group": {"clip": [10, 10, 20, 20], "operations": [{"DrawRect": {"rect": [20, 20, 40, 40]}}]}}]})");
+    EXPECT_EQ(RunWell({"draw", "s.json", "-o", "out.png", "--statistics"}),
+              "s.json -> out.png (64x64)\ndraws requested: 43\nruns: 4\ndraw calls: 4\nrecords: 43\n"
+              "variants: 1\nend of run, program: 2\nend of run, scissor: 1\nend of run, other: 1\n");
+    ExpectFails({"draw", "s.json", "-o", "-", "--statistics"}, kUsage, {"--statistics", "name a file"});
+}
+
 // A mistake leaves the picture as it was; the next good version replaces it.
 TEST_F(DrawTest, WatchingDrawsAgainWhenTheFileChanges) {
     auto const write = [this](std::string const& size) {

@@ -77,6 +77,8 @@ TEST_F(GalleryTest, EverySceneIsAPictureOnThePageAndOnDisk) {
     }
     EXPECT_EQ(FindAll(page, "alt").count(""), 0u);
     EXPECT_THAT(page, Not(HasSubstr("http")));
+    // 32 rectangles in a row.
+    EXPECT_THAT(page, HasSubstr("draws requested: 32, draw calls: 1<"));
 }
 
 // The screen's rows lie the other way round on the GPU, and its clips are counted from its lower border.

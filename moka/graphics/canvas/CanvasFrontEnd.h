@@ -1,10 +1,11 @@
-// CanvasFrontEnd: what every canvas does on its caller's side: clearing, the matrix, clips, the save stack, the
+// CanvasFrontEnd: the caller's side of every canvas: clearing, the matrix, clips, the save stack, the
 // tag. DrawingCanvas (MKCanvas.h) and PenCanvas (MKPenCanvas.h) add their operations to it. kPosts tells their
 // two flavours apart: true posts each request to the render thread, false calls the render side at once.
 // Owner:  holds the render side, which dies on the render thread.
 // Thread: one at a time; not posting, the render thread.
 // Fails:  without a render side (memory ran out, or the target does not suit) the local state works on, and
-//         every request is dropped. What a queue refuses is dropped; references taken for it stay.
+//         every request is dropped. Requests that the queue refuses are dropped; references taken for them
+//         stay.
 #pragma once
 
 #include "moka/base/Export.h"
@@ -23,7 +24,7 @@ public:
     int clipCount = 0; // clips requested, whether or not the queue took them
     Tag tag;
 
-    // The index of the new level. A part that the flag leaves out gets what it had in the level below, or the
+    // The index of the new level. A part that the flag leaves out gets its value in the level below, or the
     // identity or 0 without one, so that restoring resets it. When memory runs out there is no new level, and
     // restoring to the index does nothing.
     int Save(IMKCanvasBase::SaveFlag flag);

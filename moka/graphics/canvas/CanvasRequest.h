@@ -8,8 +8,8 @@
 namespace Moka::detail {
 
 // Calls impl->function(values...): posted as a task with copies of the values, or at once with the values
-// themselves. False when it will never run (no impl, or the queue refused): what the values own then still
-// belongs to the caller.
+// themselves. False when it will never run (no impl, or the queue refused): then the caller still owns the
+// values' objects.
 template <bool kPosts, class Impl, class Function, class... Values>
 bool Request(IGLMsgQueue* queue, Impl* impl, Function function, Values&&... values) {
     if (!impl) return false;

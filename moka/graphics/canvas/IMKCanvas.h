@@ -40,9 +40,9 @@ public:
     virtual void DrawRoundRect(RectF const& rect, float rx, float ry, MKPaint const* paint) = 0;
     virtual void DrawCircle(float cx, float cy, float radius, MKPaint const* paint) = 0;
 
-    // Only bitmaps that can be read are drawn; a screen bitmap cannot. Without src the whole bitmap is meant:
-    // its rectangle from (GetX(), GetY()) to (GetWidth(), GetHeight()), which for a bitmap that does not lie
-    // at the origin is not its own; relied upon.
+    // Screen bitmaps cannot be sampled and are not drawn. Without src the source rectangle is (GetX(), GetY())
+    // to (GetWidth(), GetHeight()). It differs from the bitmap's own rectangle if the bitmap does not lie at
+    // the origin.
     virtual void DrawBitmap(IMKBitmap* bitmap, float x, float y, MKPaint const* paint) = 0;
     virtual void DrawBitmap(IMKBitmap* bitmap, RectF const& dst, MKPaint const* paint) = 0;
     virtual void DrawBitmap(IMKBitmap* bitmap, RectF const& src, RectF const& dst, MKPaint const* paint) = 0;

@@ -1,5 +1,6 @@
-// IMKCanvasBase: what every canvas has: clearing, a matrix, clip rectangles, a save stack over both, a tag.
-// Owner:  reference counted; what a creating function returns carries one reference for its caller.
+// IMKCanvasBase: the operations of every canvas: clearing, a matrix, clip rectangles, a save stack over both,
+// a tag.
+// Owner:  reference counted; a creating function returns one reference to its caller.
 // Thread: a caller-side canvas from one thread at a time, a render-thread canvas on the render thread.
 // Units:  pixels of the target, origin top left, y down; angles in degrees, positive turns +x towards +y.
 // The order of the operations is part of the contract.

@@ -1,4 +1,4 @@
-// IMKPenCanvas: a canvas without drawing operations, for foreign GL code that draws onto a texture bitmap
+// IMKPenCanvas: a canvas without drawing operations, for external GL code that draws onto a texture bitmap
 // itself: it gives that code the matrix to draw with and the clip around its drawing.
 //
 //     canvas->EnableClipRT(0);                             on the render thread
@@ -24,8 +24,8 @@ public:
     // From the current matrix's pixels to clip space.
     virtual Matrix4<float> GetCanvasMatrix() = 0;
 
-    // Between the two GL is foreign code's: what was asked for before has been drawn, colour writes are on,
-    // and the clip is in GL. The bitmap counts as one frame buffer, whatever the index.
+    // Between the two, external code may call GL: all earlier requests have been drawn, colour writes are on,
+    // and the clip is set. The bitmap counts as one frame buffer, whatever the index.
     virtual void EnableClipRT(int frameBuffer) = 0;
     virtual void DisableClipRT() = 0;
 };

@@ -1,10 +1,10 @@
 // MKCanvas: a canvas for any thread. Each request is posted to the render thread with copies of everything it
 // needs. MKGraphicsFactory::CreateCanvas creates it. MKCanvasRT is the flavour for the render thread.
-// Owner:  as IMKCanvas. What was posted is drawn, also when the canvas is gone.
+// Owner:  as IMKCanvas. Posted requests are drawn, also when the canvas is gone.
 // Thread: any, one at a time.
 // Cost:   each call posts one task. Only calls that take a vector also copy it.
-// Fails:  what the queue refuses is dropped. References that the request took on a bitmap or a drawable are
-//         then not given back, by design.
+// Fails:  requests that the queue refuses are dropped. References that a request took on a bitmap or a
+//         drawable are then not given back, by design.
 #pragma once
 
 #include "moka/graphics/canvas/CanvasFrontEnd.h"

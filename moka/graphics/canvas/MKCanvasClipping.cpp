@@ -55,7 +55,7 @@ void MKCanvasClipping::RemoveClipRectRT(int count) {
     constexpr std::size_t kMostByCount = 1 << 16;
     std::size_t const wanted = static_cast<std::size_t>(std::max(count, 0));
     ClipInfo empty;
-    empty.matrix = Matrix3<float>(0.0f); // not the identity; relied upon
+    empty.matrix = Matrix3<float>(0.0f); // not the identity: it maps all to one point
     try {
         mClips.resize(std::min(wanted, std::max(mClips.size(), kMostByCount)), empty);
     } catch (std::bad_alloc const&) {

@@ -20,7 +20,7 @@ class IMKSubBitmap;
 
 class MKCanvasClipping : NonAssignable {
 public:
-    // The bitmap outlives this. Lets pass what the constructor of the shader throws.
+    // The bitmap outlives this. Passes exceptions of the shader's constructor on.
     explicit MKCanvasClipping(IMKBitmap* bitmap);
     virtual ~MKCanvasClipping();
 
@@ -32,7 +32,7 @@ public:
     // For the draw that follows, into a strip, or with -1 into the target as one frame buffer. Activates it
     // when there are clips.
     void EnableClipRT(int frameBuffer);
-    // Undoes what the last EnableClipRT has set; the frame buffer stays active.
+    // Undoes the last EnableClipRT; the frame buffer stays active.
     void DisableClipRT();
 
 private:

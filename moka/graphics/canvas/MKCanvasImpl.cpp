@@ -109,7 +109,7 @@ void MKCanvasImpl::DrawRT(IMKCustomDrawable* drawable, Matrix3<float> const& m, 
     if (!held) return;
     for (FrameBuffers frame(GetBitmap()); frame.Next();) {
         Drawing const ready(GetClipping(), frame.writable, -1);
-        // What foreign code gets is its own.
+        // A custom drawable gets a paint of its own.
         drawable->DrawRT(frame.writable->GetProjectionMatrix() * FromMatrix3(m), MKPaint(paint));
     }
 }

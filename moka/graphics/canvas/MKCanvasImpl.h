@@ -3,10 +3,10 @@
 // It keeps neither matrix nor paint: each request brings its own.
 // Thread: render thread; the constructor, without onRenderThread, on any.
 // Units:  pixels before the matrix, which the GPU applies: positions reach it as they are.
-// Cost:   a drawable is made at the first request that needs it. Which frame buffers a shape touches is told
-//         from its corners alone, without the width of a stroke or a fringe; relied upon.
-// Fails:  silently; a drawable whose making failed is tried again by the next request. What a shader's
-//         constructor throws passes through, after everything that the request held has been given back.
+// Cost:   a drawable is made at the first request that needs it. Strip culling uses
+//         the mapped corners only and ignores stroke width and fringe.
+// Fails:  silently; a drawable whose making failed is tried again by the next request. Exceptions of a
+//         shader's constructor pass through, after the request has released all that it held.
 #pragma once
 
 #include "moka/base/Point.h"

@@ -105,7 +105,7 @@ void MKCanvasImplBase::ClearAllRT(Vector4<float> const& rgba) {
     for (FrameBuffers frame(GetBitmap()); frame.Next();)
         frame.writable->ClearColorRT(rgba.x, rgba.y, rgba.z, rgba.w);
     if (!scissored) return;
-    // The rectangle comes back, the test does not; the rest of the frame relies on it.
+    // The rectangle is restored, the test stays off for the rest of the frame.
     rasterizer->SetScissorEnabled(false);
     rasterizer->SetScissorRect(saved);
 }

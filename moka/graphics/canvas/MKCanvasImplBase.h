@@ -1,4 +1,5 @@
-// MKCanvasImplBase: what the render sides of canvas and pen canvas share: the target, its clip, and clearing.
+// MKCanvasImplBase: the common base of the render sides of canvas and pen canvas: the target, its clip, and
+// clearing.
 // Owner:  a front end, which has it deleted on the render thread. Holds two references on the target, its own
 //         and that of the attachment.
 // Thread: render thread; the constructor, without onRenderThread, on any.
@@ -71,8 +72,8 @@ protected:
     MKCanvasClipping* GetClipping() const { return mClipping.get(); }
     void DeleteClipping() { mClipping.reset(); }
 
-    // Of a strip, or with -1 of the target as one. What would be drawn without one is dropped: it would go to
-    // whatever the host has bound.
+    // Of a strip, or with -1 of the target as one. Draws without one are dropped: they would reach the
+    // frame buffer that the host has bound.
     bool HasFrameBuffer(int index) const;
 
 private:

@@ -2,7 +2,7 @@
 // returns. MKGraphicsFactory::CreateCanvas creates it. Its operations stand in MKCanvas.h.
 // Owner:  as IMKCanvas.
 // Thread: render thread only, its destruction included.
-// Fails:  as MKCanvasImpl; what a shader's constructor throws reaches the caller.
+// Fails:  as MKCanvasImpl; exceptions of a shader's constructor reach the caller.
 #pragma once
 
 #include "moka/graphics/canvas/MKCanvas.h"

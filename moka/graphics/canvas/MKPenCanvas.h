@@ -2,8 +2,8 @@
 // thread. MKGraphicsFactory::CreatePenCanvas creates it. MKPenCanvasRT is the flavour for the render thread.
 // Owner:  as IMKPenCanvas.
 // Fails:  on a bitmap that is no texture bitmap it logs an error; then matrices, levels and the tag work,
-//         nothing is posted, the bitmap is null, and the canvas matrix is the model matrix alone. What the
-//         queue refuses is dropped.
+//         nothing is posted, the bitmap is null, and the canvas matrix is the model matrix alone. Requests
+//         that the queue refuses are dropped.
 #pragma once
 
 #include "moka/graphics/canvas/CanvasFrontEnd.h"
@@ -13,7 +13,7 @@ namespace Moka {
 
 class MKPenCanvasImpl;
 
-// What both flavours add to a canvas's front end.
+// Both flavours' addition to a canvas's front end.
 template <bool kPosts>
 class PenCanvas : public CanvasFrontEnd<IMKPenCanvas, MKPenCanvasImpl, kPosts> {
 public:

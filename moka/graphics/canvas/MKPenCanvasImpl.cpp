@@ -16,7 +16,7 @@ Matrix4<float> MKPenCanvasImpl::GetCanvasMatrix() const {
     return writable ? writable->GetProjectionMatrix() : Matrix4<float>();
 }
 
-// Foreign code may have left them off, and a commit keeps what nobody has set.
+// External GL may have left them off, and a commit keeps states that nobody has set.
 void MKPenCanvasImpl::SwitchColorWritesOn() {
     if (!mColorWrites) {
         BlendStateDescriptor descriptor(false);

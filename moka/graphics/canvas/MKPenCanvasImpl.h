@@ -1,4 +1,4 @@
-// MKPenCanvasImpl: the render side of a pen canvas: the clip around foreign drawing, without drawables.
+// MKPenCanvasImpl: the render side of a pen canvas: the clip around external drawing, without drawables.
 // Thread: render thread; the constructor, without onRenderThread, and GetCanvasMatrix on any.
 #pragma once
 

@@ -16,12 +16,12 @@ bool HasReplace(ClipList const& clips);
 // The last Replace, which makes all before it irrelevant; 0 without one.
 std::size_t FirstRelevant(ClipList const& clips);
 
-// Of a list that is not empty. Element 3 alone of a matrix tells whether it turns, and of a single clip the
-// operation does not count. Callers rely on both.
+// Of a list that is not empty. A matrix counts as rotated if its element 3 is not zero. The operation of a
+// single clip is ignored.
 bool IsScissorEnough(ClipList const& clips);
 
-// What a target of this top and height leaves visible, counted from its bottom left; all zero, which hides
-// everything, when that is nothing.
+// The visible part of a target of this top and height, counted from its bottom left. If nothing is visible, all
+// zero, which hides everything.
 ScissorRect GetScissorRect(ClipList const& clips, int targetY, int targetHeight);
 
 // The same in a frame buffer that holds a tiled target's rows from frameTop on, the first one at its bottom.

@@ -1,4 +1,4 @@
-// SourcePiece.h: what one strip contributes when a bitmap is drawn.
+// SourcePiece.h: one strip's part of a bitmap that is drawn.
 #pragma once
 
 #include "moka/base/Rect.h"
@@ -7,7 +7,7 @@ namespace Moka::detail {
 
 struct SourcePiece {
     RectF src;
-    RectF dst; // what of dst shows src
+    RectF dst; // the part of the destination that shows src
 };
 
 // The part of src that lies on the strip; false when none does.

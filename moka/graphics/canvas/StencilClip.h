@@ -1,7 +1,7 @@
-// StencilClip: draws clip rectangles into the stencil of a frame buffer, so that what is allowed holds 1.
+// StencilClip: draws clip rectangles into the stencil of a frame buffer, so that allowed pixels hold 1.
 // Thread: render thread.
-// Fails:  what the renderer refused at construction leaves the stencil cleared and the clip unmade; the
-//         constructor lets pass what the shader's throws.
+// Fails:  if a GPU object could not be created, the stencil is cleared and no clip drawn. The constructor
+//         passes exceptions of its shader on.
 #pragma once
 
 #include "moka/graphics/canvas/ScissorClip.h"
@@ -23,17 +23,17 @@ class StencilClip {
 public:
     StencilClip();
     ~StencilClip();
-    // Gives back what the constructor made; nothing can be drawn afterwards.
+    // Releases the GPU objects; nothing can be drawn afterwards.
     void Release();
     StencilClip(StencilClip const&) = delete;
     StencilClip& operator=(StencilClip const&) = delete;
 
-    // The frame buffer is active, without a scissor. Afterwards the stencil test lets through what the clips
-    // allow, the stencil does not change any more, and colours are written again.
+    // The frame buffer is active, without a scissor. Afterwards the stencil test passes the pixels that the
+    // clips allow, the stencil is not written any more, and colours are written again.
     void Draw(ClipList const& clips, IMKBitmapWritable& frameBuffer);
 
 private:
-    // What is drawn: the clip rectangle under its matrix, or everything.
+    // The area to draw: the clip rectangle under its matrix, or everything.
     struct Area {
         IGraphicsObject* graphics;
         Matrix4<float> matrix;

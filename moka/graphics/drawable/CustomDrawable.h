@@ -1,10 +1,10 @@
-// CustomDrawable: what the custom drawables share: the life of the GPU objects, which are made and released
+// CustomDrawable: the base of the custom drawables: the life of the GPU objects, which are made and released
 // on the render thread while the drawable itself is made and dropped anywhere, and the bitmaps drawn.
 // Owner:  reference counted; the creator holds the first reference, the task that makes the GPU objects one
 //         more. A queue that refuses that task leaves a drawable that draws nothing and lives for good, by
 //         design; one that refuses a release leaks that object.
 // Thread: construction, destruction and setters on the caller's thread, DrawRT on the render thread. Setters
-//         take no lock and reach the next DrawRT, also one that was asked for before.
+//         are not synchronised. They also affect draws that are posted but not yet run.
 // Fails:  silently: without GPU objects, or without a bitmap that can be sampled, DrawRT touches nothing.
 #pragma once
 
@@ -19,7 +19,7 @@
 
 namespace Moka::detail {
 
-// Not exported: what a caller may reach, through the classes below this one, is inline or virtual.
+// Not exported: callers reach its members through derived classes, and those members are inline or virtual.
 template <class Shader>
 class CustomDrawable : public IMKCustomDrawable, private RefCount {
 public:

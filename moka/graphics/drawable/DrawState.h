@@ -1,6 +1,6 @@
 // DrawState: the blend and the depth-stencil state that a drawable draws with, both its own.
 // Thread: render thread, except PostRelease.
-// Fails:  a state that the renderer refused makes it false; whoever draws asks first.
+// Fails:  false if the renderer refused a state; drawables check it before they draw.
 #pragma once
 
 #include "moka/graphics/drawable/RendererPtr.h"
@@ -17,7 +17,7 @@ public:
 
     explicit operator bool() const { return mBlend && mDepthStencil; }
 
-    // These need a state that is true. A mode is set at each draw; the renderer leaves out what is unchanged.
+    // These need a state that is true. A mode is set at each draw; the renderer skips unchanged states.
     void Apply(MKPaint::XFermode mode);
     // The two halves of it, for those who set more in between.
     void ApplyBlend(MKPaint::XFermode mode);

@@ -3,9 +3,8 @@
 // destination that is kept for the next draw onto a target of the same size.
 // Thread: render thread.
 // Units:  those of the projection's source; a bitmap's rectangles in its own pixels.
-// Fails:  without a bitmap, without room for the copy of the destination, and with what the renderer refused
-//         at construction, the draws do nothing and return false; the constructor lets pass what a shader's
-//         throws.
+// Fails:  without a bitmap, without memory for the copy of the destination, or if a GPU object could not be
+//         created, draw calls do nothing and return false. The constructor passes exceptions of its shaders on.
 #pragma once
 
 #include "moka/base/NonAssignable.h"

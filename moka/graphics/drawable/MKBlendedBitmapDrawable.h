@@ -14,7 +14,7 @@ class MKBlenderBitmapsShader;
 
 class MOKA_API MKBlendedBitmapDrawable final : public detail::CustomDrawable<MKBlenderBitmapsShader> {
 public:
-    // Takes over the caller's references on the bitmaps, unlike the setters; callers rely on it. A size of 0
+    // Takes the caller's references on the bitmaps over, unlike the setters. A size of 0
     // by 0 becomes that of the first bitmap at the next draw, and stays so.
     MKBlendedBitmapDrawable(IGLMsgQueue* queue, IMKBitmap* first, IMKBitmap* second, RectF const& src,
                             RectF const& dst, float width, float height);

@@ -2,8 +2,8 @@
 // centre, drawn once for the fill and once for the stroke.
 // Thread: render thread.
 // Units:  those of the projection's source.
-// Fails:  what the renderer refused at construction makes the draws do nothing; the constructor lets pass
-//         what the shader's throws.
+// Fails:  if a GPU object could not be created, draw calls do nothing. The constructor passes exceptions of
+//         its shader on.
 #pragma once
 
 #include "moka/base/NonAssignable.h"

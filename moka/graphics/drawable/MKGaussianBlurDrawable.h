@@ -26,8 +26,7 @@ public:
     // The distance of the nine samples from each other; 1 unless set.
     void SetBlurAmount(float amount) { mAmount = amount; }
 
-    // Shifts the content, not the rectangle it is drawn into; what comes in at the edges the paint's tile
-    // mode says.
+    // Shifts the content, not the rectangle it is drawn into. The paint's tile mode fills the edges.
     void SetOffset(float x, float y) { mOffset = {x, y}; }
 
     void DrawRT(Matrix4<float> const& projection, MKPaint const& paint) override;

@@ -1,4 +1,4 @@
-// MKGraphicsUtil: what a paint's settings mean to the renderer.
+// MKGraphicsUtil: a paint's settings as states of the renderer.
 #pragma once
 
 #include "moka/graphics/paint/MKPaint.h"

@@ -2,8 +2,8 @@
 // makes; simple lines have neither, but any number of them is one call of the renderer.
 // Thread: render thread.
 // Units:  those of the projection's source.
-// Fails:  what the renderer refused at construction makes the draws do nothing; the constructor lets pass
-//         what a shader's throws.
+// Fails:  if a GPU object could not be created, draw calls do nothing. The constructor passes exceptions of
+//         its shaders on.
 // A line narrower than 1 draws nothing, and one without length nothing that can be seen: it has no direction.
 #pragma once
 
@@ -36,8 +36,8 @@ public:
     void DrawSimpleLineRT(PointF const& start, PointF const& end, Matrix4<float> const& projection,
                           MKPaint const& paint);
 
-    // Points in pairs; an odd last one is ignored. Takes the vector over and deletes it, except when the line
-    // is narrower than 1: then it stays the caller's. Callers rely on it.
+    // Points in pairs; an odd last one is ignored. Deletes the vector. If the line is narrower than 1, the
+    // caller keeps the vector.
     void DrawSimpleLinesRT(std::vector<PointF>* points, Matrix4<float> const& projection,
                            MKPaint const& paint);
 

@@ -3,8 +3,8 @@
 // falls.
 // Thread: render thread.
 // Units:  those of the projection's source. The fringe and the stroke scale with it.
-// Fails:  what the renderer refused at construction makes the draws do nothing and return false; the
-//         constructor lets pass what the shader's throws.
+// Fails:  if a GPU object could not be created, draw calls do nothing and return false. The constructor passes
+//         exceptions of its shader on.
 #pragma once
 
 #include "moka/base/NonAssignable.h"

@@ -2,8 +2,8 @@
 // fringed triangles, each corner as a quad whose program tests the ellipse.
 // Thread: render thread.
 // Units:  those of the projection's source.
-// Fails:  what the renderer refused at construction makes the draws do nothing and return false; the
-//         constructor lets pass what a shader's throws.
+// Fails:  if a GPU object could not be created, draw calls do nothing and return false. The constructor passes
+//         exceptions of its shaders on.
 #pragma once
 
 #include "moka/base/NonAssignable.h"

@@ -46,7 +46,7 @@ struct BindingValue<BindingTypeTextureUnit> {
     using Type = int;
 };
 
-// What does not depend on the type. A look-up that throws has released its handle.
+// The part that does not depend on the type. A look-up that throws has released its handle.
 MOKA_API IParameterBinding* LookUpParameter(IShaderProgram* program, char const* name, BindingType wanted);
 [[noreturn]] MOKA_API void ThrowUnbound();
 
@@ -62,8 +62,8 @@ public:
     ParameterBinding(ParameterBinding const&) = delete;
     ParameterBinding& operator=(ParameterBinding const&) = delete;
 
-    // A uniform that the program lacks, or that its compiler removed, is accepted: what is assigned then goes
-    // nowhere. Throws InvalidArgumentException, and is unbound, when the uniform is of another type.
+    // A uniform that the program lacks, or that its compiler removed, is accepted; values assigned to it
+    // are dropped. Throws InvalidArgumentException, and is unbound, when the uniform is of another type.
     void bind(IShaderProgram* program, char const* name) {
         Release();
         mHandle = detail::LookUpParameter(program, name, T);

@@ -1,7 +1,7 @@
 // ShaderClass.h: the shape that all shader classes share. A class is its table of uniforms; from that come a
 // ParameterBinding for each, named as in GLSL, and the constructor that binds them in the table's order:
 //
-//     #define DISC_UNIFORMS(U)                    the kind is what follows BindingType in its name
+//     #define DISC_UNIFORMS(U)                    kind K stands for BindingTypeK
 //         U(Matrix4, uProjectionMatrix)
 //         U(Vector4, uColor)
 //     MOKA_SHADER_CLASS(DiscShader, DISC_UNIFORMS)                                     in a header
@@ -12,8 +12,8 @@
 //
 // Owner:  ShaderManager, which makes one for all who draw with it.
 // Thread: render thread.
-// Fails:  the constructor throws InvalidArgumentException when a uniform is not of the table's type. The
-//         bindings made so far are released, the last one first; the program is not, which is relied upon.
+// Fails:  the constructor throws InvalidArgumentException when a uniform is not of the table's type. It
+//         releases the bindings made so far, the last one first, and keeps the program.
 #pragma once
 
 #include "moka/graphics/drawable/ParameterBinding.h"

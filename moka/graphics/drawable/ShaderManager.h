@@ -40,7 +40,7 @@ public:
 
     // The shader of the class, with one user more; give it back with ReleaseShader. Null when memory ran out:
     // for the shader, whose class then has none from here on, or for its entry, which the next call tries
-    // again. What the shader's constructor throws passes through and leaves everything as it was.
+    // again. An exception of the shader's constructor passes through and changes nothing.
     template <class T>
     T* GetShader() {
         AutoCriticalSection const hold(mLock);

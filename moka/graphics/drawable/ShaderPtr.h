@@ -16,7 +16,7 @@ struct GiveShaderBack {
 template <class Shader>
 using ShaderPtr = std::unique_ptr<Shader, GiveShaderBack<Shader>>;
 
-// As ShaderManager::GetShader: null when memory ran out, and what the shader's constructor throws.
+// As ShaderManager::GetShader: null when memory ran out; exceptions of the shader's constructor pass.
 template <class Shader>
 ShaderPtr<Shader> GetShader() {
     return ShaderPtr<Shader>(ShaderManager::GetInstance()->GetShader<Shader>());

@@ -1,5 +1,5 @@
-// Device: what the recorder needs from a GPU: objects by name, transfers of pixels, and the submission of draw
-// lists. Which device a program has is decided when linking: each device defines MakeDevice.
+// Device: the interface of the recorder to a GPU: objects by name, transfers of pixels, and the submission of
+// draw lists. Which device a program has is decided when linking: each device defines MakeDevice.
 // Owner:  the recorder, from attaching a context to detaching it.
 // Thread: render thread.
 // Units:  pixels; texture row 0 is row 0 of the frame buffer over it. RGBA8, premultiplied alpha.
@@ -48,7 +48,7 @@ enum class HostState {
 
 class Device {
 public:
-    // Deletes what the device made for itself: samplers, vertex arrays, buffers.
+    // Deletes the device's own objects: samplers, vertex arrays, buffers.
     virtual ~Device() = default;
 
     virtual DeviceCaps GetCaps() const = 0;
@@ -85,7 +85,7 @@ public:
 
     // Sets GL state for external GL that draws next.
     virtual void Commit(StateCommit const& commit) = 0;
-    // Gives the host back what Submit, Commit and the transfers took from it.
+    // Restores the state of the host that Submit, Commit and the transfers changed.
     virtual void RestoreHost(HostState what) = 0;
     // External GL may have changed any state.
     virtual void InvalidateState() = 0;

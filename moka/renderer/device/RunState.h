@@ -52,7 +52,7 @@ struct Sampling {
 };
 
 struct TextureRef {
-    DeviceName texture = 0; // 0: the unit keeps what GL has there
+    DeviceName texture = 0; // 0: the unit keeps its texture
     Sampling sampling;
     int unit = 0;
 

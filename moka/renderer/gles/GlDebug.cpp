@@ -63,7 +63,17 @@ void GlDebug::Attach(RendererProcLoader loader) {
     Gl::GetIntegerv(GL_MAX_LABEL_LENGTH_KHR, &mMaxLabelLength);
     // Debug output starts switched on in debug contexts and off in others, and a driver may spend time on
     // messages that nobody asked for.
-    if (Gl::IsEnabled(GL_DEBUG_OUTPUT_KHR)) InstallCallback(loader);
+    if (!Gl::IsEnabled(GL_DEBUG_OUTPUT_KHR)) return;
+    LoadGroups(loader);
+    InstallCallback(loader);
+}
+
+void GlDebug::LoadGroups(RendererProcLoader loader) {
+    auto const push = reinterpret_cast<PFNGLPUSHDEBUGGROUPKHRPROC>(loader("glPushDebugGroupKHR"));
+    auto const pop = reinterpret_cast<PFNGLPOPDEBUGGROUPKHRPROC>(loader("glPopDebugGroupKHR"));
+    if (!push || !pop) return;
+    mPushGroup = push;
+    mPopGroup = pop;
 }
 
 void GlDebug::InstallCallback(RendererProcLoader loader) {
@@ -85,6 +95,8 @@ void GlDebug::Detach() {
     if (mSetCallback) mSetCallback(nullptr, nullptr);
     mSetCallback = nullptr;
     mObjectLabel = nullptr;
+    mPushGroup = nullptr;
+    mPopGroup = nullptr;
 }
 
 void GlDebug::Label(GLenum identifier, GLuint name, char const* text) const {

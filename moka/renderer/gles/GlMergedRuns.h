@@ -51,7 +51,7 @@ private:
     std::vector<GLushort> mNumbers; // of each vertex: its record's place in the block
     GLuint mRecordBuffer = 0;
     GLuint mNumberBuffer = 0;
-    std::size_t mAlignment = 0; // of a block in its buffer, bytes; 0 before it was asked for
+    std::size_t mAlignment = 0; // of a block in its buffer, bytes; 0 before it was queried
 };
 
 } // namespace Moka::detail

@@ -7,7 +7,7 @@
 namespace Moka::detail {
 namespace {
 
-// Leaves GL's defaults behind, in which foreign code may trust.
+// Leaves GL's defaults behind, as external GL may expect.
 template <class Access>
 class GlPixelStoreScope {
 public:

@@ -78,7 +78,7 @@ void GlState::SetDepthStencil(DepthStencilStateDescriptor const& descriptor) {
 void GlState::BindTexture(int unit, GLuint texture, GLuint sampler) {
     Unit& bound = mUnits[static_cast<std::size_t>(unit)];
     if (bound.texture != texture) {
-        // Foreign code finds its own unit active again.
+        // External GL finds its own unit active again.
         GlOverride<GlActiveUnitAccess> const active(activeUnit, unit);
         Gl::BindTexture(GL_TEXTURE_2D, texture);
         bound.texture = texture;

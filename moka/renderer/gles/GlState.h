@@ -1,5 +1,5 @@
 // GlState: the cache of the actual GL state, one value for each part that the renderer sets or depends on.
-// Redundant calls are not made. What the host had before is GlHostState's.
+// Redundant calls are not made. GlHostState keeps the state of the host.
 // Thread: render thread.
 #pragma once
 
@@ -21,7 +21,7 @@ public:
     // Somebody else may have changed anything.
     void Invalidate();
 
-    // What a draw is made under; each counts what it changes.
+    // The state of a draw. Each setter counts its changes.
     void SetScissorTest(bool on);
     void SetScissorRect(GlBox const& box);
     // The rectangle only while the test is on.
@@ -50,14 +50,14 @@ public:
     GlShadow<GlPixelStoreAccess<GlPackNames>> pack{counters};
 
     // Units for sampling are 0 up to this number. The one after them is kept for uploads and copies, so that
-    // what foreign code and draws have bound stays bound.
+    // bindings of external GL and of draws stay.
     int GetSamplingUnitCount() const { return static_cast<int>(mUnits.size()) - 1; }
 
     void BindTexture(int unit, GLuint texture, GLuint sampler);
-    // No sampler of ours stays on any unit, where it would overrule the parameters of a foreign texture.
+    // No sampler of ours stays on any unit, where it would overrule the parameters of an external texture.
     void UnbindSamplers();
 
-    // GL undoes the bindings of what is deleted; so does the shadow.
+    // GL unbinds deleted objects; so does the shadow.
     void ForgetTexture(GLuint texture);
     void ForgetSampler(GLuint sampler);
     void ForgetVertexArray(GLuint name);

@@ -126,7 +126,7 @@ void GlProgramAccess::Apply(GLuint value, GLuint const*) { Gl::UseProgram(value)
 void GlBlendAccess::Apply(Value const& value, Value const* known) {
     Switch(GL_BLEND, value.on, known ? &known->on : nullptr);
     if (!value.on) return;
-    // Nobody here sets another equation, so it needs setting only where foreign code may have.
+    // Nobody here sets another equation, so it needs setting only where external GL may have.
     if (!known) Gl::BlendEquation(GL_FUNC_ADD);
     Gl::BlendFuncSeparate(value.color[0], value.color[1], value.alpha[0], value.alpha[1]);
 }

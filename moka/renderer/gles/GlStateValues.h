@@ -71,8 +71,9 @@ struct GlDepthStencilMaskAccess {
 };
 inline constexpr GlDepthStencilMaskAccess::Value kGlAllDepthStencil{GL_TRUE, 0xFFu, 0xFFu};
 
-// What must be off for everything the renderer does, a bit for each that is on: nothing is culled, dithered,
-// offset, covered by samples, or thrown away before the rasterizer, nor tested for depth unless a state asks.
+// Switches that must be off for all work of the renderer, a bit for each that is on: nothing is culled,
+// dithered, offset, covered by samples, or thrown away before the rasterizer, nor tested for depth unless a
+// state asks.
 struct GlObstaclesAccess {
     using Value = unsigned;
     static constexpr Value kDepthTest = 1u;
@@ -102,7 +103,7 @@ struct GlBlendAccess {
     // While blending is off the rest is of no interest and stays zero.
     struct Value {
         bool on = false;
-        GLenum color[2] = {}; // the factors of source and destination; what is done with both is adding
+        GLenum color[2] = {}; // the factors of source and destination; the two are added
         GLenum alpha[2] = {};
 
         friend bool operator==(Value const& a, Value const& b) {
@@ -187,7 +188,7 @@ struct GlPackNames {
     static constexpr GLenum kSkipPixels = GL_PACK_SKIP_PIXELS;
 };
 
-// For GlShadow. There is no query: foreign code finds GL's defaults again, not what it left.
+// For GlShadow. There is no query: external GL finds GL's defaults again, not its own values.
 template <class Names>
 struct GlPixelStoreAccess {
     using Value = GlPixelStore;

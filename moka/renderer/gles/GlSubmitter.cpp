@@ -3,9 +3,33 @@
 #include "moka/renderer/gles/GlDevice.h"
 #include "moka/renderer/gles/GlTables.h"
 
+#include <algorithm>
+#include <string>
+
 namespace Moka::detail {
 
 void GlSubmitter::Submit(DrawList const& list) {
+    if (mDevice.debug.HasGroups()) {
+        GlDebugGroup const group(mDevice.debug, DescribeFlush(list).c_str());
+        ExecuteAll(list);
+    } else {
+        ExecuteAll(list);
+    }
+}
+
+// The draws are those requested since the last flush.
+std::string GlSubmitter::DescribeFlush(DrawList const& list) {
+    Counters const& counters = mDevice.counters;
+    std::uint64_t const draws = counters.drawRequests - mDescribedRequests;
+    mDescribedRequests = counters.drawRequests;
+    auto const runs = std::count_if(list.commands.begin(), list.commands.end(), [](Command const& command) {
+        return std::holds_alternative<Run>(command);
+    });
+    return "moka flush " + std::to_string(counters.flushes + 1) + ": " + std::to_string(draws) + " draws, " +
+           std::to_string(runs) + " runs";
+}
+
+void GlSubmitter::ExecuteAll(DrawList const& list) {
     mList = &list;
     mApplied = nullptr;
     if (!list.vertices.empty()) {

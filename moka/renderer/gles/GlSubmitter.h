@@ -4,6 +4,9 @@
 
 #include "moka/renderer/device/DrawList.h"
 
+#include <cstdint>
+#include <string>
+
 namespace Moka::detail {
 
 class GlDevice;
@@ -15,6 +18,8 @@ public:
     void Submit(DrawList const& list);
 
 private:
+    std::string DescribeFlush(DrawList const& list);
+    void ExecuteAll(DrawList const& list);
     void Execute(Run const& run);
     void Execute(ColorClear const& clear);
     void Execute(DepthStencilClear const& clear);
@@ -33,6 +38,7 @@ private:
     GlDevice& mDevice;
     DrawList const* mList = nullptr;
     RunState const* mApplied = nullptr; // null after anything but a run
+    std::uint64_t mDescribedRequests = 0;
 };
 
 } // namespace Moka::detail

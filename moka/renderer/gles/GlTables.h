@@ -1,4 +1,4 @@
-// GlTables.h: the renderer's numbers and what they are in GL. GL_NONE stands for "names nothing".
+// GlTables.h: the renderer's numbers as GL's. GL_NONE stands for "names nothing".
 #pragma once
 
 #include "moka/renderer/BlendStateDescriptor.h"

@@ -34,7 +34,7 @@ private:
         VertexDescriptor descriptor;
         GLuint vertexArray = 0;
         GLuint numberedArray = 0;
-        int first = 0; // what the numbered array was set to
+        int first = 0; // vertex that the numbered array begins at
         std::size_t numbers = 0;
     };
 

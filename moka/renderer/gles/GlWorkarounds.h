@@ -1,4 +1,4 @@
-// GlWorkarounds: what drivers get wrong, and what the renderer does about it: one table of rows, in the source
+// GlWorkarounds: faults of drivers and how the renderer avoids them: one table of rows, in the source
 // file, with driver, cause and cure.
 // Owner:  the context, which reads GL_RENDERER once.
 // Thread: render thread.

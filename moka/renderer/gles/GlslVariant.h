@@ -1,6 +1,6 @@
 // GlslVariant.h: rewrites the text of a program so that its uniforms become values that differ from vertex to
 // vertex: the vertex stage reads them from an array of records in a uniform block, by a number that each vertex
-// has, and hands what the fragment stage uses on as flat inputs. Samplers stay uniforms. No GL is needed.
+// has, and hands the uniforms of the fragment stage on as flat inputs. Samplers stay uniforms. No GL is needed.
 //
 //     uniform highp float uRadius;    becomes, in the fragment stage,
 //     flat in highp float moka_uRadius; highp float uRadius;
@@ -22,7 +22,7 @@ inline constexpr char kRecordBlock[] = "MokaRecords";
 // Of the vertices' numbers; the last one that every device has.
 inline constexpr unsigned kRecordLocation = 15;
 // Bytes of the block that every device has room for.
-inline constexpr std::size_t kBlockBytes = 16 * 1024;
+inline constexpr std::size_t kBlockBytes = std::size_t{16} * 1024;
 // Vectors from stage to stage that every device has room for.
 inline constexpr int kMostVaryings = 15;
 

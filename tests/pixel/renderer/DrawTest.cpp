@@ -1,6 +1,9 @@
 // Draws: what reaches GL, in which order, and how few calls it takes.
 #include "tests/pixel/renderer/DrawFixture.h"
 
+#include <EGL/egl.h>
+#include <GLES2/gl2ext.h>
+
 namespace Moka::Testing {
 namespace {
 
@@ -28,6 +31,32 @@ TEST_P(DrawTest, DrawsKeepTheirOrderAndAdjacentOnesThatShareEverythingAreOneCall
               With(With(With(Filled(kBlue), kRed, 0, 0, 8, 4), kGreen, 2, 2, 2, 6), kRed, 3, 3, 1, 1));
     EXPECT_EQ(Count().draws, before + 3);
     EXPECT_EQ(Count().drawRequests, 10u);
+}
+
+void GL_APIENTRY KeepGroup(GLenum, GLenum type, GLuint, GLenum, GLsizei, GLchar const* text,
+                           void const* user) {
+    auto* const groups = static_cast<std::vector<std::string>*>(const_cast<void*>(user));
+    if (type == GL_DEBUG_TYPE_PUSH_GROUP_KHR) groups->emplace_back(text);
+    if (type == GL_DEBUG_TYPE_POP_GROUP_KHR) groups->emplace_back("end");
+}
+
+TEST_P(DrawTest, AFlushIsAGroupForGlDebuggers) {
+    RendererFactory::SetDeferred(true);
+    std::string const number = std::to_string(Count().flushes + 1);
+    auto const setCallback =
+        reinterpret_cast<PFNGLDEBUGMESSAGECALLBACKKHRPROC>(eglGetProcAddress("glDebugMessageCallbackKHR"));
+    std::vector<std::string> groups;
+    setCallback(KeepGroup, &groups);
+    target->Activate();
+    blend->Apply();
+    stencil->Apply();
+    Fill(kRed, 0, 0, 1, 4);
+    Fill(kRed, 1, 0, 2, 4);
+    Fill(kGreen, 1, 0, 2, 4);
+    RendererFactory::Flush();
+    setCallback(nullptr, nullptr);
+    EXPECT_EQ(groups, (std::vector<std::string>{"moka flush " + number + ": 3 draws, 1 runs", "end"}));
+    target->Deactivate(false, false);
 }
 
 TEST_P(DrawTest, AdjacentStripsStayApart) {
