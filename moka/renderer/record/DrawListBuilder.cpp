@@ -54,6 +54,7 @@ void DrawListBuilder::AddDraw(RunState const& state, bool isKnownSame, ProgramSt
         OpenNewRun(stateIndex, record, draw.bounds, vertices.stride);
     }
     mDrawnFloats = std::max(mDrawnFloats, vertices.offset + vertices.size);
+    mListedFloats += static_cast<std::size_t>(draw.count) * vertices.stride;
 }
 
 void DrawListBuilder::AddSeparateDraw(SeparateDraw const& draw) {
@@ -290,6 +291,7 @@ void DrawListBuilder::Clear(bool full) {
     mRunCount = 0;
     mFirstOpenRun = 0;
     mDrawnFloats = 0;
+    mListedFloats = 0;
     mFlushReason = full ? RunEnd::Full : RunEnd::Other;
     ++mNumber;
 }

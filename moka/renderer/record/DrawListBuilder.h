@@ -92,8 +92,8 @@ public:
     bool IsEmpty() const { return mList.commands.empty(); }
     // Large enough for the GPU to begin while the rest is recorded.
     bool IsFull() const {
-        return mList.vertices.size() >= kFullFloats || mList.commands.size() >= kFullCommands ||
-               mList.uniforms.size() >= kFullBytes;
+        return mList.vertices.size() >= kFullFloats || mListedFloats >= 2 * kFullFloats ||
+               mList.commands.size() >= kFullCommands || mList.uniforms.size() >= kFullBytes;
     }
     // Complete: the runs' records and vertices are in their order.
     DrawList const& Finish();
@@ -168,6 +168,8 @@ private:
     RunEnd mFlushReason = RunEnd::Other; // why the list before this one ended
     std::size_t mLastState = 0;          // of the last draw
     std::size_t mDrawnFloats = 0;        // draws refer to vertices before it
+    // Of all draws: vertices that are drawn again may have to be copied.
+    std::size_t mListedFloats = 0;
     // So that marks of earlier lists mean nothing in this one.
     std::uint64_t mNumber = 1;
     std::unordered_map<DeviceName, std::uint64_t> mTextureUses; // the number of the last list that used it
