@@ -164,7 +164,7 @@ TEST_F(StencilPreparationsTest, OneIsDrawnAgainOnlyWhenTheBufferMayHoldSomething
         {"pDfd", 1},     {"pdfD", 2},   // a smaller one and a larger one after a flush
         {"pdfDd", 2},    {"pdfDfD", 2}, // which then holds
         {"pqrd", 1},                    // nobody needed the first two
-        {"pdwpd", 2},                   // a draw that writes
+        {"pdwpd", 2},    {"pdfwpd", 3}, // a draw that writes, for which the rest is drawn before
         {"pdcpd", 3},    {"pdzpd", 3},  // a clear with depth
         {"pdxpd", 2},                   // a discard
         {"pdsqdpd", 3},                 // another strip's preparation in the same buffer
@@ -174,7 +174,6 @@ TEST_F(StencilPreparationsTest, OneIsDrawnAgainOnlyWhenTheBufferMayHoldSomething
     for (auto const& [steps, clears] : cases) {
         TakeStrip(0);
         RendererFactory::SetDeferred(true);
-        RendererFactory::InvalidateState();
         std::uint64_t const before = RendererFactory::GetStatistics().clears;
         for (char const* step = steps; *step != 0; ++step) Do(*step);
         RendererFactory::Flush();
@@ -195,7 +194,7 @@ TEST_F(StencilPreparationsTest, ThePartThatIsDrawnEnclosesTheDrawsThatNeedIt) {
     };
     detail::DrawListBuilder const& list = detail::GetAttachedRecorder()->list;
     for (auto const& [draws, part] : cases) {
-        RendererFactory::InvalidateState();
+        Do('e');
         Prepare(1, 1);
         for (DrawBounds const& bounds : draws) Draw(bounds);
         ASSERT_GE(list.GetList().commands.size(), 3u);
