@@ -406,8 +406,8 @@ TEST_F(MergedProgramsTest, PositionsAgreeToTheBit) {
     constexpr Texts kTurned{
         "turned",
         "attribute vec2 corner; uniform mat4 matrix; uniform vec2 pair; uniform highp float number;"
-        "void main() { vec2 p = (corner * pair + number) * 1.5;"
-        "gl_Position = matrix * vec4(p / number - 0.25, 0.0, 1.0); }",
+        "void main() { vec2 p = (corner * pair * 1.5 + number) / number - 1.0;"
+        "gl_Position = matrix * vec4(p, 0.0, 1.0); }",
         "precision highp float; uniform vec4 color; void main() { gl_FragColor = color; }"};
     BlendStateDescriptor add(true);
     add.SetColorEquation(BlendingFunction::Add, BlendingFactor::One, BlendingFactor::One);
@@ -421,18 +421,19 @@ TEST_F(MergedProgramsTest, PositionsAgreeToTheBit) {
         program->MakeCurrent();
         Set("color", BindingTypeVector4, std::array<float, 4>{2 / 255.0f, 0, 0, 0});
         for (int i = 0; i < 100; ++i) {
-            float const angle = static_cast<float>(i) * 0.31415926f / 4;
+            // A cell of three pixels that grows by three and turns by an angle whose tangent is a ratio of two odd
+            // numbers.
             std::array<float, 16> matrix{};
-            matrix[0] = matrix[5] = std::cos(angle);
-            matrix[1] = std::sin(angle);
+            matrix[0] = matrix[5] = static_cast<float>(i % 3 * 2 + 1) / 3;
+            matrix[1] = static_cast<float>(i % 5 * 2 + 1) / 3;
             matrix[4] = -matrix[1];
-            matrix[12] = static_cast<float>(i % 9 - 4) / kTargetSize;
+            matrix[12] = static_cast<float>(i % 9 - 4) * 2 / kTargetSize;
             matrix[15] = 1;
+            float const number = 0.7f + static_cast<float>(i) * 0.013f;
             Set("matrix", BindingTypeMatrix4, matrix);
-            Set("pair", BindingTypeVector2, std::array<float, 2>{1, 1 + static_cast<float>(i % 7)});
-            Set("number", BindingTypeFloat, 0.7f + static_cast<float>(i) * 0.013f);
-            DrawCell(220 + i % 5);
-            DrawCell(220);
+            Set("pair", BindingTypeVector2, std::array<float, 2>{2 * number, 2 * number});
+            Set("number", BindingTypeFloat, number);
+            DrawCell(kColumns * kColumns / 2);
         }
         RendererFactory::Flush();
         return ReadTarget();

@@ -141,13 +141,13 @@ using StencilOrderTest = RendererFixture;
 
 TEST_F(StencilOrderTest, DeferredAndImmediateGiveTheSamePictures) {
     std::uint64_t clears[2] = {};
-    for (unsigned seed = 0; seed < 60; ++seed) {
+    for (unsigned seed = 0; seed < 40; ++seed) {
         Picture pictures[2][2];
         for (bool const isDeferred : {false, true}) {
             RendererFactory::SetDeferred(isDeferred);
             std::uint64_t const before = RendererFactory::GetStatistics().clears;
             Scene scene(seed);
-            scene.Draw(40);
+            scene.Draw(30);
             for (std::size_t i : {0u, 1u}) pictures[isDeferred][i] = scene.Read(i);
             clears[isDeferred] += RendererFactory::GetStatistics().clears - before;
         }
