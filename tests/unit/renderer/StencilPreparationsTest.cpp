@@ -119,6 +119,11 @@ protected:
             return active->ClearDepthStencil(true, 1, true, 0);
         case 'z':
             return active->ClearDepthStencil(true, 1, false, 0);
+        case 'k': // the program that prepares goes
+            width.reset();
+            maskProgram.reset(RendererFactory::CreateShaderProgram("", "uniform float width;", "mask"));
+            width.reset(maskProgram->GetParameter("width"));
+            return;
         case 'f':
             return RendererFactory::Flush();
         case 'x':
@@ -164,6 +169,7 @@ TEST_F(StencilPreparationsTest, OneIsDrawnAgainOnlyWhenTheBufferMayHoldSomething
         {"pDfd", 1},     {"pdfD", 2},   // a smaller one and a larger one after a flush
         {"pdfDd", 2},    {"pdfDfD", 2}, // which then holds
         {"pqrd", 1},                    // nobody needed the first two
+        {"pdfkD", 2},    {"pkd", 1},    // its program goes
         {"pdwpd", 2},    {"pdfwpd", 3}, // a draw that writes, for which the rest is drawn before
         {"pdcpd", 3},    {"pdzpd", 3},  // a clear with depth
         {"pdxpd", 2},                   // a discard
