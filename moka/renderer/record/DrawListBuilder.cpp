@@ -79,7 +79,7 @@ void DrawListBuilder::SetScissor(std::size_t command, ScissorState const& scisso
 
 std::size_t DrawListBuilder::AddState(RunState const& state, bool isKnownSame) {
     std::vector<RunState>& states = mList.states;
-    if (!states.empty() && isKnownSame) return mLastState;
+    if (isKnownSame && mLastState != kNoState) return mLastState;
     std::size_t const reach = std::min(states.size(), kReach);
     auto const found =
         std::find(states.rbegin(), states.rbegin() + static_cast<std::ptrdiff_t>(reach), state);
@@ -290,6 +290,7 @@ void DrawListBuilder::Clear(bool full) {
     mDraws.clear();
     mRunCount = 0;
     mFirstOpenRun = 0;
+    mLastState = kNoState;
     mDrawnFloats = 0;
     mListedFloats = 0;
     mFlushReason = full ? RunEnd::Full : RunEnd::Other;

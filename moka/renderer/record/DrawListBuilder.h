@@ -112,6 +112,7 @@ private:
     // Vertices of a run that are copied at most to make it contiguous.
     static constexpr int kMostGathered = 1 << 14;
     static constexpr std::uint32_t kEnd = ~std::uint32_t{0};
+    static constexpr std::size_t kNoState = ~std::size_t{0};
 
     struct Draw {
         Record record;
@@ -166,7 +167,7 @@ private:
     std::size_t mRunCount = 0;
     std::size_t mFirstOpenRun = 0;       // runs before it lie behind another command
     RunEnd mFlushReason = RunEnd::Other; // why the list before this one ended
-    std::size_t mLastState = 0;          // of the last draw
+    std::size_t mLastState = kNoState;   // of this list's last draw that was no separate one
     std::size_t mDrawnFloats = 0;        // draws refer to vertices before it
     // Of all draws: vertices that are drawn again may have to be copied.
     std::size_t mListedFloats = 0;

@@ -8,6 +8,7 @@
 #include "moka/renderer/record/TextureStorage.h"
 
 #include <algorithm>
+#include <new>
 #include <utility>
 
 namespace Moka::detail {
@@ -49,7 +50,7 @@ void Recorder::Prepare() {
         if (!mIsExternal) requested->Forget();
         mDevice->InvalidateState();
     }
-    if (mHasDropped && list.IsEmpty()) DeleteDropped();
+    if (mHasDropped && IsIdle()) DeleteDropped();
 }
 
 void Recorder::End() {
@@ -144,7 +145,7 @@ void Recorder::Flush() {
     mHolders.clear();
     list.Clear(isFull);
     counters.listBytes.Set(list.GetCapacityBytes());
-    if (mHasDropped) DeleteDropped();
+    if (mHasDropped && IsIdle()) DeleteDropped();
 }
 
 void Recorder::FlushIfUsed(DeviceName texture) {
@@ -171,6 +172,11 @@ void Recorder::Deactivate(RenderTarget const& target) {
     mDevice->RestoreHost(HostState::All);
 }
 
+void Recorder::CompleteStencils() {
+    mStencils.Finish();
+    if (mActive) mStencils.Complete(mActive->GetRef());
+}
+
 void Recorder::CommitStates() {
     StateCommit commit;
     requested->AddStatesTo(commit);
@@ -187,7 +193,7 @@ void Recorder::FlushForHost() {
 
 void Recorder::CommitForExternal() {
     if (!Begin()) return;
-    mStencils.Finish();
+    CompleteStencils();
     Flush();
     mStencils.ForgetAll();
     StateCommit commit;
@@ -210,6 +216,7 @@ void Recorder::InvalidateState() {
     mIsExternal = false;
     SetFlushesAtOnce();
     if (!Begin()) return;
+    CompleteStencils();
     mStencils.ForgetAll();
     mDevice->InvalidateState();
     requested->Forget();
@@ -217,7 +224,7 @@ void Recorder::InvalidateState() {
 
 void Recorder::SetDeferred(bool on) {
     if (!Begin()) return;
-    mStencils.Finish();
+    CompleteStencils();
     Flush();
     mStencils.ForgetAll();
     mIsDeferred = on;
@@ -240,10 +247,20 @@ void Recorder::Drop(DroppedKind kind, DeviceName name) {
 }
 
 void Recorder::DropProgram(ProgramState const& program, DeviceName name) {
-    if (mAttached && IsRenderThread() && requested->GetProgram().get() == &program) {
-        requested->SetProgram(nullptr);
+    if (mAttached && IsRenderThread()) {
+        if (requested->GetProgram().get() == &program) requested->SetProgram(nullptr);
+        if (mStencils.Uses(name)) TryToCompleteStencils();
     }
     Drop(DroppedKind::Program, name);
+}
+
+// Without memory the clip is lost, as a draw would be.
+void Recorder::TryToCompleteStencils() noexcept {
+    try {
+        CompleteStencils();
+    } catch (std::bad_alloc const&) {
+        mStencils.ForgetAll();
+    }
 }
 
 void Recorder::DropTextureObject() {
@@ -268,7 +285,7 @@ void Recorder::Delete(Dropped const& dropped) {
         --counters.frameBuffers;
         return;
     case DroppedKind::Program:
-        mStencils.ForgetAll();
+        mStencils.ForgetUses(dropped.name);
         mDevice->DeleteProgram(dropped.name);
         --counters.programs;
         return;

@@ -133,13 +133,18 @@ private:
         mDevice->Commit(state);
     }
     void SetFlushesAtOnce() { mFlushesAtOnce = mIsExternal || !mIsDeferred; }
-    bool MayDeleteNow() const { return mAttached && IsRenderThread() && list.IsEmpty(); }
+    // Nothing that waits refers to a name.
+    bool IsIdle() const { return list.IsEmpty() && !mStencils.IsPending(); }
+    bool MayDeleteNow() const { return mAttached && IsRenderThread() && IsIdle(); }
     void Prepare();
     void Delete(Dropped const& dropped);
     void DeleteDropped();
     bool TakeForStencil(RunState const& state, GraphicsObject& object, int first, int count);
     void SampleCopyOfTarget(RunState& state);
     void CommitStates();
+    // Before the stencil of the active target is left to others, or what draws it goes. Throws bad_alloc.
+    void CompleteStencils();
+    void TryToCompleteStencils() noexcept;
 
     std::unique_ptr<Device> mDevice;
     std::thread::id const mRenderThread = std::this_thread::get_id();

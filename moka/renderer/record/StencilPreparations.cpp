@@ -67,7 +67,7 @@ bool StencilPreparations::Recipe::IsSame(Recipe const& other) const {
 bool StencilPreparations::TakeClear(DepthStencilClear const& clear) {
     DeviceName const buffer = clear.target.depthStencil;
     if (clear.clearDepth || !clear.clearStencil || clear.scissor.on) {
-        Finish();
+        Complete(clear.target);
         Forget(buffer);
         return false;
     }
@@ -101,7 +101,7 @@ void StencilPreparations::BeforeDraw(RunState const& state, DrawBounds const& bo
     if (state.target.depthStencil == 0) return;
     DeviceName const buffer = state.target.depthStencil;
     if (WritesStencil(state)) {
-        Finish();
+        Complete(state.target);
         Forget(buffer);
         return;
     }
@@ -123,6 +123,22 @@ void StencilPreparations::Finish() {
     Content& content = Replace(target.depthStencil);
     std::swap(content.recipe, mPending);
     Ensure(content, target, ToPixels({}, target));
+}
+
+void StencilPreparations::Complete(TargetRef const& target) {
+    Finish();
+    if (Content* const content = Find(target.depthStencil)) Ensure(*content, target, ToPixels({}, target));
+}
+
+bool StencilPreparations::Recipe::Uses(DeviceName program) const {
+    return std::any_of(steps.begin(), steps.end(),
+                       [=](Step const& step) { return !step.isClear && step.state.program == program; });
+}
+
+bool StencilPreparations::Uses(DeviceName program) const {
+    return (mIsPending && mPending.Uses(program)) ||
+           std::any_of(mContents.begin(), mContents.end(),
+                       [=](Content const& content) { return content.recipe.Uses(program); });
 }
 
 StencilPreparations::Content* StencilPreparations::Find(DeviceName buffer) {
@@ -182,6 +198,13 @@ void StencilPreparations::Forget(DeviceName depthStencil) {
     if (IsPendingFor(depthStencil)) mIsPending = false;
     if (Content* const content = Find(depthStencil))
         mContents.erase(mContents.begin() + (content - mContents.data()));
+}
+
+void StencilPreparations::ForgetUses(DeviceName program) {
+    if (mPending.Uses(program)) mIsPending = false;
+    mContents.erase(std::remove_if(mContents.begin(), mContents.end(),
+                                   [=](Content const& content) { return content.recipe.Uses(program); }),
+                    mContents.end());
 }
 
 void StencilPreparations::ForgetAll() {

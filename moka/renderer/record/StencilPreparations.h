@@ -28,10 +28,17 @@ public:
     bool IsPending() const { return mIsPending; }
     // Before a draw that tests the stencil is recorded: the buffer holds what the draw tests. Throws bad_alloc.
     void BeforeDraw(RunState const& state, DrawBounds const& bounds);
-    // Before the buffer is written in another way, or external GL may see it: what is kept is recorded.
+    // What is kept is recorded.
     void Finish();
+    // Before the target's buffer is written in another way, or external GL may see it: what is kept is recorded,
+    // and drawn all over the target.
+    void Complete(TargetRef const& target);
+    // Whether one that is kept or that a buffer holds is drawn with the program.
+    bool Uses(DeviceName program) const;
     // The buffer's contents are not known any more.
     void Forget(DeviceName depthStencil);
+    // The program is deleted.
+    void ForgetUses(DeviceName program);
     void ForgetAll();
 
 private:
@@ -57,6 +64,7 @@ private:
 
         void Clear();
         bool IsSame(Recipe const& other) const;
+        bool Uses(DeviceName program) const;
     };
 
     // What one buffer holds inside a part of it.

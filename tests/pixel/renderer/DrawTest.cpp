@@ -59,22 +59,6 @@ TEST_P(DrawTest, AFlushIsAGroupForGlDebuggers) {
     target->Deactivate(false, false);
 }
 
-TEST_P(DrawTest, AdjacentStripsStayApart) {
-    VertexDescriptor layout;
-    layout.addAttribute(VertexAttributeType::Float, 2, -1, 0);
-    GraphicsPtr const strip(
-        RendererFactory::CreateGraphicsObject(1, PrimitiveType::TriangleStrip, &layout, 0, 0));
-    target->Activate();
-    Fill(kRed, 0, 7, 1, 8);
-    for (float const at : {0.0f, 6.0f}) {
-        float const corners[] = {at, at, at, at + 2, at + 2, at, at + 2, at + 2};
-        strip->SetVertices(0, corners, 4);
-        EXPECT_TRUE(strip->Draw(0, -1, 1));
-    }
-    target->Deactivate(false, false);
-    EXPECT_EQ(Read(), With(With(With(Filled(kClear), kRed, 0, 7, 1, 1), kRed, 0, 0, 2, 2), kRed, 6, 6, 2, 2));
-}
-
 TEST_P(DrawTest, CountsAndFirstAreCutToWhatIsThere) {
     target->Activate();
     colored->program->MakeCurrent();
