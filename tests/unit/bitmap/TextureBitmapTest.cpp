@@ -103,6 +103,9 @@ TEST_F(TextureBitmap, CanvasesHoldItAndItsFrameBuffers) {
     EXPECT_EQ(CountOf(bitmap.Get()), 2);
     queue.RunAll();
     EXPECT_EQ(RendererFactory::GetStatistics().renderTargets, 2);
+    bitmap->GetTextureBitmap()->AttachDepthBuffer();
+    queue.RunAll();
+    EXPECT_EQ(RendererFactory::GetStatistics().depthStencilBuffers, 2);
     attachable->DetachFromCanvas();
     EXPECT_EQ(CountOf(bitmap.Get()), 1);
     queue.RunAll();
