@@ -82,6 +82,7 @@ TEST_F(TextureBitmap, ACallbackMayDropTheLastReference) {
 
 TEST_F(TextureBitmap, UpdatesReachTheStripsTheyTouch) {
     auto const bitmap = NewBitmap(4, 2 * kMaxSide);
+    EXPECT_EQ(ReadAll(bitmap), Pixels(4 * 2 * kMaxSide * 4)) << "transparent, whatever memory held";
     auto const countUploads = [&] {
         queue.RunAll();
         int const count = RendererTrace::CountCalls("Replace");
