@@ -21,16 +21,27 @@ public:
 
     detail::DeviceCaps GetCaps() const override { return Caps(); }
 
+    // A driver may leave anything; a loud colour shows who reads it all the same.
+    detail::DeviceName CreateTexture(int width, int height) override {
+        detail::DeviceName const name = NullDevice::CreateTexture(width, height);
+        MakeLoud({0, name, width, height, 0});
+        return name;
+    }
+
     // Rows packed, in texture order.
     std::vector<unsigned char> const& GetTexels(detail::DeviceName texture) {
         return GetImage({0, texture, 0, 0, 0}).pixels;
     }
 
 private:
-    // A driver may leave anything; a loud colour shows who reads it all the same.
     void Execute(detail::Discard const& discard) override {
-        detail::TargetRef const& target = discard.target;
-        if (discard.color) GetImage(target).Fill({0, 0, target.width, target.height}, {1, 0, 1, 1});
+        if (discard.color) MakeLoud(discard.target);
+    }
+    void Execute(detail::TextureClear const& clear) override { Fill(clear.target, {0, 0, 0, 0}); }
+
+    void MakeLoud(detail::TargetRef const& target) { Fill(target, {1, 0, 1, 1}); }
+    void Fill(detail::TargetRef const& target, std::array<float, 4> const& color) {
+        GetImage(target).Fill({0, 0, target.width, target.height}, color);
     }
 };
 

@@ -55,12 +55,12 @@ protected:
     // The texture's image, or the one host frame buffer that there is, which grows with its targets.
     NullImage& GetImage(TargetRef const& target);
     virtual void Execute(Discard const& discard);
+    virtual void Execute(TextureClear const& clear);
 
 private:
     void Execute(Run const& run);
     void Execute(ColorClear const& clear);
     void Execute(DepthStencilClear const& clear);
-    void Execute(TextureClear const& clear);
     void Execute(TargetCopy const& copy);
     void Execute(TextureDraw const& draw);
     void Copy(TargetRef const& from, TargetRef const& to, int width, int height);

@@ -8,6 +8,7 @@
 #include "tests/support/LogCapture.h"
 #include "tests/support/NothingLeft.h"
 
+#include <GLES3/gl3.h>
 #include <gmock/gmock.h>
 
 #include <array>
@@ -101,13 +102,16 @@ TEST_F(RenderThreadTest, TurnsAwayASecondOneAndTheFirstGoesOnWithItsDefaultFrame
 
     EXPECT_THAT(first->GetContextInfo().path, HasSubstr("pbuffer 64 x 1"));
     std::array<Pixel, 64> row{};
+    GLint stencilBits = 0;
     first->Call([&] {
+        glGetIntegerv(GL_STENCIL_BITS, &stencilBits);
         IRenderTarget* const target = RendererFactory::CreateRenderTargetFromDefault(64, 1);
         target->ClearColor(1.0f, 0.4f, 0.0f, 1.0f);
         target->ReadPixels(0, 0, 64, 1, {row.data(), 64, 0, 0});
         target->Release();
     });
     EXPECT_THAT(row, Each(kOrange));
+    EXPECT_EQ(stencilBits, 8);
     first.reset();
     EXPECT_TRUE(MustStart());
 }

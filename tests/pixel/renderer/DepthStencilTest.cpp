@@ -79,6 +79,23 @@ TEST_F(DepthStencilTest, ABufferIsAttachedToTheTargetThatTookItLastUntilEitherGo
     EXPECT_EQ(GetAttachment(image), 0);
 }
 
+TEST_F(DepthStencilTest, AFrameBufferUnderTheNameOfADeletedOneGetsABufferAnew) {
+    glBindFramebuffer(GL_FRAMEBUFFER, kLastName);
+    glBindFramebuffer(GL_FRAMEBUFFER, 0);
+    DepthStencilPtr const buffer = MakeDepthStencil(4, 4);
+    GLint names[2] = {};
+    for (GLint& name : names) {
+        OffscreenImage const image = MakeOffscreen(MakeImage(4, 4));
+        image.target->AttachDepthStencil(buffer.get());
+        EXPECT_NE(GetAttachment(image), 0);
+        image.target->Activate();
+        name = GetInteger(GL_DRAW_FRAMEBUFFER_BINDING);
+        image.target->Deactivate(false, false);
+    }
+    EXPECT_EQ(names[0], names[1]);
+    glDeleteFramebuffers(1, &kLastName);
+}
+
 TEST_F(DepthStencilTest, WhatDoesNotFitIsRefusedWithALine) {
     OffscreenImage const image = MakeOffscreen(MakeImage(4, 4));
     HostFrameBuffer const host(4, 4);

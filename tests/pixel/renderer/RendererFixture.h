@@ -30,6 +30,9 @@ constexpr Color kGreen{0, 255, 0, 255};
 constexpr Color kBlue{0, 0, 255, 255};
 constexpr Color kUntouched{0xEE, 0xDD, 0xCC, 0xBB};
 
+// A driver that counts names upwards gives deleted ones away again once this one is taken. A host may take any.
+constexpr GLuint kLastName = 0xFFFFFFFE;
+
 Picture MakeImage(int width, int height, Color const& fill = kUntouched);
 // Every pixel different from every other.
 Picture MakePattern(int width, int height);

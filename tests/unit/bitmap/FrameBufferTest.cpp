@@ -34,6 +34,10 @@ TEST_F(FrameBuffer, LivesFromTheFirstCanvasToTheLast) {
     strip->ReleaseFrameBufferRT(false);
     EXPECT_EQ(Targets(), 0);
     strip->ReleaseFrameBufferRT(false); // one too many
+    Pixels pixels(4 * 4 * 4);
+    strip->GetBitmapData(Rect(0, 0, 4, 4), pixels.data());
+    strip->GetPixel(Point(1, 1));
+    EXPECT_EQ(Targets(), 0) << "reading gives back what it takes";
     strip->CreateFrameBufferRT(false);
     EXPECT_EQ(Targets(), 1);
 }

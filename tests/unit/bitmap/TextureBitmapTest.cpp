@@ -82,6 +82,7 @@ TEST_F(TextureBitmap, ACallbackMayDropTheLastReference) {
 
 TEST_F(TextureBitmap, UpdatesReachTheStripsTheyTouch) {
     auto const bitmap = NewBitmap(4, 2 * kMaxSide);
+    EXPECT_EQ(ReadAll(bitmap), Pixels(4 * 2 * kMaxSide * 4)) << "transparent, whatever memory held";
     auto const countUploads = [&] {
         queue.RunAll();
         int const count = RendererTrace::CountCalls("Replace");
@@ -103,6 +104,9 @@ TEST_F(TextureBitmap, CanvasesHoldItAndItsFrameBuffers) {
     EXPECT_EQ(CountOf(bitmap.Get()), 2);
     queue.RunAll();
     EXPECT_EQ(RendererFactory::GetStatistics().renderTargets, 2);
+    bitmap->GetTextureBitmap()->AttachDepthBuffer();
+    queue.RunAll();
+    EXPECT_EQ(RendererFactory::GetStatistics().depthStencilBuffers, 2);
     attachable->DetachFromCanvas();
     EXPECT_EQ(CountOf(bitmap.Get()), 1);
     queue.RunAll();

@@ -85,6 +85,25 @@ TEST_F(RecorderTest, VerticesAreHandedOverOnceAndDrawnAgainAfterAFlush) {
     }
 }
 
+// Vertices that nobody drew are replaced in the list only while they are its end.
+TEST_F(RecorderTest, VerticesOfTwoObjectsStayEachItsOwnWhicheverGetsNewOnes) {
+    VertexDescriptor descriptor;
+    descriptor.addAttribute(VertexAttributeType::Float, 1, -1, 0);
+    IGraphicsObject* const other =
+        RendererFactory::CreateGraphicsObject(1, PrimitiveType::TriangleList, &descriptor, 0, 0);
+    float const vertices[] = {5, 6, 7};
+    SetVertices({0, 1, 2});
+    other->SetVertices(0, vertices, 3);
+    SetVertices({10, 11, 12, 13, 14, 15});
+    EXPECT_TRUE(other->Draw(0, -1, 1));
+    EXPECT_TRUE(graphics->Draw(0, -1, 1));
+    std::vector<TracedDraw> const draws = RendererTrace::GetDraws();
+    ASSERT_EQ(draws.size(), 2u);
+    EXPECT_EQ(draws[0].vertices[0], 5);
+    EXPECT_EQ(draws[1].vertices[0], 10);
+    other->Release();
+}
+
 TEST_F(RecorderTest, AProgramBuiltAgainInANewContextKeepsItsValuesAndHandles) {
     float value = 2.5f;
     width->Set(&value);
