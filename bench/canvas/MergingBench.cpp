@@ -69,8 +69,9 @@ void Buttons(benchmark::State& state) {
     line.SetLineWidth(2);
     Measure(state, kButtons, [&] {
         for (int i = 0; i < kButtons; ++i) {
+            int const row = i / kColumns;
             float const x = static_cast<float>(i % kColumns) * 50 + 4;
-            float const y = static_cast<float>(i / kColumns) * 40 + 4;
+            float const y = static_cast<float>(row) * 40 + 4;
             SetColor(fill, ColorOf(i, Colors::Distinct));
             target.canvas->DrawRoundRect({x, y, x + 44, y + 32}, 6, 6, &fill);
             target.canvas->DrawBitmap(icon.Get(), x + 4, y + 10, &line);

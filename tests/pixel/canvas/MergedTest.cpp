@@ -38,7 +38,7 @@ private:
     void ChangeMatrix(IMKCanvas& canvas) {
         canvas.SetMatrix(Matrix3<float>());
         if (Flip()) canvas.PreTranslate(Between(-20, 20), Between(-20, 20));
-        if (Flip()) canvas.PreRotate(Between(0, 90), kWidth / 2, kHeight / 2);
+        if (Flip()) canvas.PreRotate(Between(0, 90), kWidth / 2.0f, kHeight / 2.0f);
         if (Flip()) canvas.PreScale(Between(0.5f, 2), Between(0.5f, 2));
     }
 
@@ -47,7 +47,7 @@ private:
         mLevel = canvas.Save(IMKCanvasBase::SaveAll);
         if (Flip()) return;
         canvas.SetMatrix(Matrix3<float>());
-        if (Flip()) canvas.PreRotate(Between(5, 40), kWidth / 2, kHeight / 2);
+        if (Flip()) canvas.PreRotate(Between(5, 40), kWidth / 2.0f, kHeight / 2.0f);
         canvas.SetClipRect(Below(40), Below(30), 60 + Below(60), 50 + Below(40),
                            Flip() ? IMKCanvasBase::Intersect : IMKCanvasBase::Replace);
     }
