@@ -12,14 +12,6 @@ if(MOKA_SANITIZE)
   target_link_options(moka_compile_options INTERFACE -fsanitize=${MOKA_SANITIZE})
 endif()
 
-# Optimised libraries are linked as one unit, since a draw passes through forty source files: recording one takes a
-# quarter less time. The objects also hold code, because static libraries may be linked by another compiler.
-set(MOKA_LINKS_AS_ONE_UNIT OFF)
-if(CMAKE_BUILD_TYPE MATCHES "Rel" AND CMAKE_CXX_COMPILER_ID STREQUAL "GNU" AND NOT MOKA_SANITIZE)
-  include(CheckIPOSupported)
-  check_ipo_supported(RESULT MOKA_LINKS_AS_ONE_UNIT OUTPUT reason LANGUAGES CXX)
-endif()
-
 set(CMAKE_POSITION_INDEPENDENT_CODE ON)
 set(CMAKE_CXX_VISIBILITY_PRESET hidden)
 set(CMAKE_VISIBILITY_INLINES_HIDDEN ON)
@@ -45,10 +37,6 @@ function(moka_library name kind)
     set(kind STATIC)
   endif()
   add_library(${name} ${kind} ${arg_SOURCES})
-  if(MOKA_LINKS_AS_ONE_UNIT AND NOT kind STREQUAL "INTERFACE")
-    set_target_properties(${name} PROPERTIES INTERPROCEDURAL_OPTIMIZATION ON)
-    target_compile_options(${name} PRIVATE -ffat-lto-objects)
-  endif()
   if(kind STREQUAL "SHARED")
     # Loadable where pages have 16 KB, as on new Android devices.
     target_link_options(${name} PRIVATE -Wl,-z,max-page-size=16384)
