@@ -119,7 +119,8 @@ public:
         while (done < block.size()) {
             ssize_t const written = write(mFile, block.data() + done, block.size() - done);
             if (written < 0 && errno == EINTR) continue;
-            if (written <= 0) return Fail(written < 0 ? std::strerror(errno) : "the file takes no more bytes");
+            if (written <= 0)
+                return Fail(written < 0 ? std::strerror(errno) : "the file takes no more bytes");
             done += static_cast<std::size_t>(written);
         }
         mBytes += static_cast<off_t>(done);

@@ -24,6 +24,7 @@
 #include "moka/graphics/factory/MKGraphicsFactory.h"
 #include "moka/graphics/task/IGLMsgQueue.h"
 
+#include <algorithm>
 #include <cstddef>
 #include <memory>
 #include <new>
@@ -34,18 +35,17 @@ namespace Moka {
 
 enum class UseFrom { RenderThread, AnyThread }; // in the factory's order: without and with the queue
 
-// Transparent.
-inline RefPtr<IMKBitmap> NewBitmap(IGLMsgQueue& queue, int width, int height,
-                                   UseFrom from = UseFrom::AnyThread) {
-    return RefPtr<IMKBitmap>::Adopt(MKGraphicsFactory::CreateBitmap(&queue, width, height, nullptr, false,
-                                                                    static_cast<int>(from), false));
-}
-
 // From tightly packed pixels, which stay the caller's and valid until the render thread has uploaded them.
 inline RefPtr<IMKBitmap> NewBitmap(IGLMsgQueue& queue, int width, int height, void const* pixels,
                                    UseFrom from = UseFrom::AnyThread) {
     return RefPtr<IMKBitmap>::Adopt(
         MKGraphicsFactory::CreateBitmap(&queue, width, height, pixels, false, static_cast<int>(from), false));
+}
+
+// Transparent.
+inline RefPtr<IMKBitmap> NewBitmap(IGLMsgQueue& queue, int width, int height,
+                                   UseFrom from = UseFrom::AnyThread) {
+    return NewBitmap(queue, width, height, nullptr, from);
 }
 
 // From image, whose pixels it takes over. They are copied only if image does not own them, or if its rows are
@@ -109,7 +109,8 @@ inline RefPtr<IMKBitmap> LoadBitmap(IGLMsgQueue& queue, std::string const& path,
     return NewBitmap(queue, std::move(image), from);
 }
 
-// The bitmap's pixels, when everything that was posted before has been drawn. Transparent if the queue refuses.
+// The bitmap's pixels, when everything that was posted before has been drawn. Null without memory, or if the queue
+// refuses, for instance because it was stopped.
 inline std::unique_ptr<Bitmap> ReadBitmap(IMKBitmap& bitmap) {
     int const width = bitmap.GetWidth();
     int const height = bitmap.GetHeight();
@@ -119,6 +120,13 @@ inline std::unique_ptr<Bitmap> ReadBitmap(IMKBitmap& bitmap) {
     std::unique_ptr<Bitmap> image(new (std::nothrow) Bitmap);
     if (!pixels || !image) return nullptr;
     bitmap.GetBitmapData(bitmap.GetBitmapRect(), pixels.get());
+    // The reading has no result. A pixel that is read into its opposite and stays that has not been read.
+    unsigned char opposite[4];
+    unsigned char probe[4];
+    for (int i = 0; i < 4; ++i) opposite[i] = probe[i] = static_cast<unsigned char>(~pixels[i]);
+    Rect const all = bitmap.GetBitmapRect();
+    bitmap.GetBitmapData(Rect(all.left, all.top, all.left + 1, all.top + 1), probe);
+    if (std::equal(probe, probe + 4, opposite)) return nullptr;
     if (image->Construct(pixels.get(), width, height, width * 4, Bitmap::kFormatRgba8888, false, true))
         static_cast<void>(pixels.release());
     return image;
@@ -130,7 +138,7 @@ inline bool SaveBitmap(IMKBitmap& bitmap, std::string const& path, int quality =
                        std::string* reason = nullptr) {
     std::unique_ptr<Bitmap> const image = ReadBitmap(bitmap);
     if (!image) {
-        if (reason) *reason = "not enough memory to read the bitmap back";
+        if (reason) *reason = "the bitmap cannot be read back: its queue refuses, or memory has run out";
         return false;
     }
     String const name = String::FromFileName(path);

@@ -279,8 +279,6 @@ bool DrawListBuilder::UsesTexture(DeviceName texture) const {
     return found != mTextureUses.end() && found->second == mNumber;
 }
 
-bool DrawListBuilder::Uses(ProgramState const& program) const { return program.listed.list == mNumber; }
-
 void DrawListBuilder::Clear(bool full) {
     mList.commands.clear();
     mList.states.clear();

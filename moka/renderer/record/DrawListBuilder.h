@@ -85,7 +85,6 @@ public:
     DrawList const& GetList() const { return mList; }
     // Whether a command in the list reads or writes the texture.
     bool UsesTexture(DeviceName texture) const;
-    bool Uses(ProgramState const& program) const;
     // The name means nothing any more; the list is empty.
     void ForgetTexture(DeviceName texture) { mTextureUses.erase(texture); }
 

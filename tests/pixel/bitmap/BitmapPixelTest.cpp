@@ -13,6 +13,7 @@
 #include "tests/support/ImageCompare.h"
 #include "tests/support/LogCapture.h"
 #include "tests/support/NothingLeft.h"
+#include "tests/support/Queues.h"
 #include "tests/support/TestFiles.h"
 #include "tests/support/TestImages.h"
 
@@ -173,6 +174,12 @@ TEST_F(PixelBitmap, ASavedBitmapIsLoadedWithEveryPixelAndAMissingFileSaysWhy) {
     EXPECT_NE(reason.find("unknown extension 'bmp'"), std::string::npos) << reason;
     EXPECT_FALSE(LoadBitmap(*queue, folder.Path("missing.png"), &reason));
     EXPECT_NE(reason.find("No such file"), std::string::npos) << reason;
+
+    RefusingQueue refusing; // as one that was stopped
+    auto const unread = NewBitmap(refusing, 4, 4);
+    EXPECT_FALSE(SaveBitmap(*unread, folder.Path("picture.mki"), 100, &reason));
+    EXPECT_NE(reason.find("refuses"), std::string::npos) << reason;
+    ExpectSame(Read(LoadBitmap(*queue, folder.Path("picture.mki"))), image);
     log.Clear();
 }
 
