@@ -175,10 +175,20 @@ TEST_F(PixelBitmap, ASavedBitmapIsLoadedWithEveryPixelAndAMissingFileSaysWhy) {
     EXPECT_FALSE(LoadBitmap(*queue, folder.Path("missing.png"), &reason));
     EXPECT_NE(reason.find("No such file"), std::string::npos) << reason;
 
-    RefusingQueue refusing; // as one that was stopped
-    auto const unread = NewBitmap(refusing, 4, 4);
-    EXPECT_FALSE(SaveBitmap(*unread, folder.Path("picture.mki"), 100, &reason));
-    EXPECT_NE(reason.find("refuses"), std::string::npos) << reason;
+    ASSERT_TRUE(queue->Call([&] {
+        bool refuse = false;
+        RefusingQueue refusing(RefusingQueue::Predicate([&](int, ITask*) { return refuse; }));
+        {
+            auto const unread = NewBitmap(refusing, 4, 4);
+            refuse = true; // as a queue that was stopped does
+            EXPECT_FALSE(SaveBitmap(*unread, folder.Path("picture.mki"), 100, &reason));
+            EXPECT_NE(reason.find("refuses"), std::string::npos) << reason;
+            refuse = false;
+            IMKSubBitmap* const strip = unread->GetTextureBitmap()->GetSubBitmap(0);
+            for (int read = 0; read < 2; ++read) strip->Unref(); // the references of the refused tasks
+        }
+        refusing.RunAll();
+    }));
     ExpectSame(Read(LoadBitmap(*queue, folder.Path("picture.mki"))), image);
     log.Clear();
 }
