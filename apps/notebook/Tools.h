@@ -1,0 +1,75 @@
+// Tools: what the pen does to the page: writing, erasing, selecting, moving and scaling.
+// Thread: the window's.
+// Units:  page pixels; `zoom` is how many of the window's pixels one has, for what is aimed at by hand.
+#pragma once
+
+#include "apps/notebook/Painter.h"
+#include "apps/notebook/PenPath.h"
+
+#include <cstdint>
+#include <optional>
+
+namespace Moka::Notebook {
+
+enum class Tool { Pen, Highlighter, StrokeEraser, PartEraser, Select };
+
+class Tools {
+public:
+    static constexpr float kEraserRadius = 10; // of the window's pixels
+
+    Tools(Page& page, Painter& painter) : mPage(page), mPainter(painter) {}
+
+    void Choose(Tool tool);
+    Tool GetTool() const { return mTool; }
+    void SetColor(unsigned rgb) { mColor = 0xFF000000 | rgb; }
+    unsigned GetColor() const { return mColor; }
+    void SetWidth(float width) { mWidth = width; }
+    float GetWidth() const { return mWidth; }
+
+    // Pressure as PenPath takes it.
+    void Down(PointF at, std::uint32_t time, float pressure, double zoom);
+    void Move(PointF at, std::uint32_t time, float pressure, double zoom);
+    void Up();
+    void Cancel(); // as if the pen had not come down
+    bool IsDown() const { return mIsDown; }
+
+    void Select(Objects objects) { mSelected = std::move(objects); }
+    bool HasSelection() const { return !mSelected.empty(); }
+    void DeleteSelected();
+    // The selection while it is dragged, which the tiles do not show; where it was when the drag began.
+    bool IsDragging() const { return mDrag != Drag::None; }
+
+    // What is not on the tiles: the live stroke, on to `ahead` milliseconds from now, the lasso, the selection.
+    void Draw(IMKCanvas& canvas, double zoom, float ahead) const;
+
+    // Of the stroke that has just been written, so that it goes onto the tiles as it is.
+    static unsigned GetInk(Tool tool, unsigned color);
+
+private:
+    enum class Drag { None, Move, Scale };
+
+    void Erase(PointF to, double zoom);
+    void EraseFrom(std::size_t index, Swipe const& swipe);
+    bool BeginDrag(PointF at, double zoom);
+    void SelectInside();
+    void EndDrag();
+    RectF GetSelectedBounds() const;
+    Placement GetPlacement() const;
+    void DrawSelection(IMKCanvas& canvas, double zoom) const;
+
+    Page& mPage;
+    Painter& mPainter;
+    Tool mTool = Tool::Pen;
+    unsigned mColor = 0xFF1B2A41;
+    float mWidth = 3;
+
+    bool mIsDown = false;
+    PointF mFirst;
+    PointF mLast;
+    std::optional<PenPath> mPath;
+    std::vector<PointF> mLasso;
+    Objects mSelected;
+    Drag mDrag = Drag::None;
+};
+
+} // namespace Moka::Notebook
