@@ -187,7 +187,8 @@ void Notebook::DrawMessage(IMKCanvas& canvas) const {
     // Long ones take several lines.
     auto const perLine =
         static_cast<std::size_t>(std::max(20.0f, (width - 24) / MeasureLetters("m", kLetter)));
-    float const lines = static_cast<float>((text.size() + perLine - 1) / perLine);
+    std::size_t const count = (text.size() + perLine - 1) / perLine;
+    auto const lines = static_cast<float>(count);
     float const top = bottom - lines * (kLine - 12) - 12;
     MKPaint const back = MakePaint(isAsking ? 0xF0FFF8DC : mIsError ? 0xF0FBE3E0 : 0xF0E3F3E6);
     canvas.DrawRect(0, top, width, bottom, &back);

@@ -157,7 +157,7 @@ void Notebook::Text(std::string const& text) {
 
 void Notebook::Do(Command command) {
     float const x = static_cast<float>(mView.width) / 2;
-    float const y = static_cast<float>(mView.top + mView.height / 2);
+    float const y = static_cast<float>(mView.top) + static_cast<float>(mView.height) / 2;
     std::string const& path = mDocument.GetPath();
     mIsDirty = true;
     switch (command) {

@@ -4,6 +4,8 @@
 #include "scenes/SceneFields.h"
 #include "scenes/SceneText.h"
 
+#include <algorithm>
+#include <cmath>
 #include <cstdio>
 #include <filesystem>
 #include <nlohmann/json.hpp>
@@ -13,7 +15,6 @@ namespace Moka::Notebook {
 namespace {
 
 namespace fs = std::filesystem;
-using Scenes::SceneError;
 using Scenes::SceneFields;
 using Scenes::SceneValue;
 
@@ -71,7 +72,7 @@ ObjectPtr ReadStroke(SceneFields& fields) {
     SceneFields paint(fields.Get("paint"));
     Vector4<float> const c = Scenes::ReadColor(paint.Get("color"));
     paint.CheckAll();
-    auto const byte = [](float value) { return static_cast<unsigned>(value * 255 + 0.5f) & 0xFFu; };
+    auto const byte = [](float value) { return static_cast<unsigned>(std::lround(value * 255)) & 0xFFu; };
     stroke.argb = byte(c.w) << 24 | byte(c.x) << 16 | byte(c.y) << 8 | byte(c.z);
     SceneValue const& points = fields.Get("points");
     if (points.kind != SceneValue::Kind::List || points.items.empty())
@@ -116,15 +117,15 @@ public:
         std::string_view head = text.substr(0, start);
         std::string_view rest = text.substr(start + sizeof(kStart) - 1);
         int line = static_cast<int>(std::count(head.begin(), head.end(), '\n')) + 2;
-        if (!Guard(0, [&] { ReadHead(Scenes::ParseSceneText(std::string(head) + "\"operations\": []}")); }))
-            return false;
+        std::string const headAlone = std::string(head) + "\"operations\": []}";
+        if (!Parse(0, headAlone, [&](SceneValue const& root) { ReadHead(root); })) return false;
         for (; !rest.empty(); ++line) {
             std::size_t const end = std::min(rest.find('\n'), rest.size());
             std::string_view operation = rest.substr(0, end);
             rest.remove_prefix(std::min(end + 1, rest.size()));
             if (operation == "]}") return true;
             if (!operation.empty() && operation.back() == ',') operation.remove_suffix(1);
-            Guard(line, [&] { Add(Scenes::ParseSceneText(operation)); });
+            Parse(line, operation, [&](SceneValue const& value) { Add(value); });
         }
         Tell(line, " the file ends before its operations do");
         return true;
@@ -132,8 +133,7 @@ public:
 
     void ReadTree(std::string_view text) {
         mResult = {};
-        Guard(0, [&] {
-            SceneValue const root = Scenes::ParseSceneText(text);
+        Parse(0, text, [&](SceneValue const& root) {
             Guard(0, [&] { ReadHead(root); });
             SceneFields fields(root);
             for (SceneValue const& item : fields.Get("operations").items) Guard(0, [&] { Add(item); });
@@ -155,7 +155,16 @@ private:
         fields.CheckAll();
     }
 
-    // line: of the text that is read, minus one; 0 for the whole file.
+    // line: where the text stands in the file; 0 for the whole file.
+    template <class Function>
+    bool Parse(int line, std::string_view text, Function const& function) {
+        SceneValue root; // outlives the errors that name values of it
+        return Guard(line, [&] {
+            root = Scenes::ParseSceneText(text);
+            function(root);
+        });
+    }
+
     template <class Function>
     bool Guard(int line, Function const& function) {
         int const before = line > 0 ? line - 1 : 0;

@@ -69,7 +69,8 @@ bool TileCache::ShowExact(IMKCanvas& screen, Viewport const& view, int pageHeigh
     int const top = std::max(0, view.y) / kSide;
     int const right = (std::min(width, view.x + view.width) - 1) / kSide;
     int const bottom = (std::min(height, view.y + view.height) - 1) / kSide;
-    mNeeded = static_cast<std::size_t>(std::max(0, right - left + 1) * std::max(0, bottom - top + 1));
+    mNeeded = static_cast<std::size_t>(std::max(0, right - left + 1)) *
+              static_cast<std::size_t>(std::max(0, bottom - top + 1));
     std::size_t objects = 0;
     bool isDone = true;
     MKPaint paint;

@@ -61,14 +61,8 @@ int Run(Options const& options) {
     return status;
 }
 
-} // namespace
-
-int main(int argc, char** argv) {
-    std::signal(SIGXFSZ, SIG_IGN); // a file that may not grow is an error of its own
-    SetLogPriority(ANDROID_LOG_ERROR);
-    MKBitmapFactory_UseNativeDecoder();
-    Options options;
-    CLI::App app(kDescription, "moka-notebook");
+// The exit status, or -1 to go on.
+int Parse(CLI::App& app, Options& options, int argc, char** argv) {
     app.footer(kFooter);
     app.set_version_flag("--version", "moka-notebook " MOKA_VERSION);
     app.add_option("PAGE", options.page,
@@ -90,8 +84,20 @@ int main(int argc, char** argv) {
         if (error.get_exit_code() == 0) return app.exit(error);
         return Fail(std::string(error.what()) + "; see moka-notebook --help"), 2;
     }
+    return -1;
+}
+
+} // namespace
+
+int main(int argc, char** argv) {
+    std::signal(SIGXFSZ, SIG_IGN); // a file that may not grow is an error of its own
+    SetLogPriority(ANDROID_LOG_ERROR);
+    MKBitmapFactory_UseNativeDecoder();
     try {
-        return Run(options);
+        Options options;
+        CLI::App app(kDescription, "moka-notebook");
+        int const status = Parse(app, options, argc, argv);
+        return status >= 0 ? status : Run(options);
     } catch (std::exception const& error) {
         return Fail(error.what());
     }
