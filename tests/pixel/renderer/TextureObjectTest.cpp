@@ -105,7 +105,7 @@ TEST_F(TextureObjectTest, SamplingIsLinearAndClampedUntilSaidOtherwise) {
     constexpr int kRefused[][2] = {{TextureParamWrappingS, 2},
                                    {TextureParamWrappingT, 4},
                                    {TextureParamWrappingS, -1},
-                                   {TextureParamFilteringMin, 2},
+                                   {TextureParamFilteringMin, -1},
                                    {TextureParamFilteringMag, 3},
                                    {2, 0},
                                    {3, 1},
