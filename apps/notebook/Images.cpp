@@ -2,6 +2,7 @@
 
 #include "moka/base/BitmapFactory.h"
 #include "moka/base/String.h"
+#include "moka/graphics/bitmap/IMKBitmapReadable.h"
 
 namespace Moka::Notebook {
 
@@ -65,6 +66,8 @@ bool Images::HasFailed(std::string const& file) const {
 }
 
 void Images::Receive(int id, IMKBitmap* bitmap) {
+    // As the page's file says it: an image is often drawn much smaller than it is.
+    if (bitmap) bitmap->GetBitmapReadable()->SetTextureFilter(TextureFilterMipmapped);
     {
         std::lock_guard<std::mutex> const lock(mMutex);
         mResults.push_back({id, RefPtr<IMKBitmap>::Share(bitmap)});

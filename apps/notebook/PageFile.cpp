@@ -220,7 +220,8 @@ std::string WritePage(Objects const& objects, int height, std::string const& fol
         if (auto const* const image = std::get_if<Image>(&object->content))
             files.insert(Quote(NameFile(image->file, folder)));
     for (std::string const& file : files)
-        text += (&file == &*files.begin() ? "\n" : ",\n") + file + ": {\"file\": " + file + "}";
+        text += (&file == &*files.begin() ? "\n" : ",\n") + file + ": {\"file\": " + file +
+                ", \"filter\": \"Mipmapped\"}";
     text += std::string("},\n") + kStart;
     for (ObjectPtr const& object : objects) {
         text += WriteOperation(*object, folder);

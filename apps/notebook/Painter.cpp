@@ -9,14 +9,23 @@ MKPaint MakePaint(unsigned argb) {
     return paint;
 }
 
+RefPtr<MKStrokeDrawable> MakeInk(IGLMsgQueue& queue) {
+    return RefPtr<MKStrokeDrawable>::Adopt(new MKStrokeDrawable(&queue));
+}
+
+void AppendInk(MKStrokeDrawable& ink, InkPoints const& points, std::size_t from) {
+    std::vector<MKStrokePoint> copy;
+    copy.reserve(points.size() - from);
+    for (std::size_t i = from; i < points.size(); ++i)
+        copy.push_back({points[i].x, points[i].y, points[i].width});
+    ink.Append(copy.data(), static_cast<int>(copy.size()));
+}
+
 void DrawInk(IMKCanvas& canvas, InkPoints const& points, unsigned argb) {
-    MKPaint paint = MakePaint(argb);
-    if (points.size() == 1) canvas.DrawCircle(points[0].x, points[0].y, points[0].width / 2, &paint);
-    paint.SetLineCapType(MKPaint::Round);
-    for (std::size_t i = 0; i + 1 < points.size(); ++i) {
-        paint.SetLineWidth((points[i].width + points[i + 1].width) / 2);
-        canvas.DrawLine(points[i].x, points[i].y, points[i + 1].x, points[i + 1].y, &paint);
-    }
+    auto const ink = MakeInk(*canvas.GetMsgQueue());
+    AppendInk(*ink, points, 0);
+    MKPaint const paint = MakePaint(argb);
+    canvas.Draw(ink.Get(), &paint);
 }
 
 std::size_t Painter::Paint(IMKCanvas& canvas, RectF const& area) const {

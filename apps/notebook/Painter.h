@@ -4,7 +4,9 @@
 
 #include "apps/notebook/Images.h"
 #include "apps/notebook/Page.h"
+#include "moka/base/RefPtr.h"
 #include "moka/graphics/canvas/IMKCanvas.h"
+#include "moka/graphics/drawable/MKStrokeDrawable.h"
 #include "moka/graphics/paint/MKPaint.h"
 
 #include <set>
@@ -13,7 +15,11 @@ namespace Moka::Notebook {
 
 MKPaint MakePaint(unsigned argb);
 
-// One stroke in one coverage.
+// A stroke without points; those from `from` on are appended to it.
+RefPtr<MKStrokeDrawable> MakeInk(IGLMsgQueue& queue);
+void AppendInk(MKStrokeDrawable& ink, InkPoints const& points, std::size_t from);
+
+// The page holds the strokes; the GPU has their points only while they are drawn onto tiles.
 void DrawInk(IMKCanvas& canvas, InkPoints const& points, unsigned argb);
 
 class Painter {

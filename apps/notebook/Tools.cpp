@@ -20,8 +20,8 @@ bool Contains(RectF const& r, PointF const& p) {
 
 } // namespace
 
-unsigned Tools::GetInk(Tool tool, unsigned color) {
-    return tool == Tool::Highlighter ? (color & 0xFFFFFFu) | 0x60000000u : color;
+unsigned Tools::GetInk() const {
+    return mTool == Tool::Highlighter ? (mColor & 0xFFFFFFu) | 0x60000000u : mColor;
 }
 
 void Tools::Choose(Tool tool) {
@@ -38,6 +38,7 @@ void Tools::Down(PointF at, std::uint32_t time, float pressure, double zoom) {
         bool const isPlain = mTool == Tool::Highlighter;
         mPath.emplace(isPlain ? mWidth * kHighlighter : mWidth, isPlain);
         mPath->Add(at.x, at.y, time, pressure);
+        mLiveCount = 0;
     } else if (mTool != Tool::Select) {
         mPage.Begin();
         Erase(at, zoom);
@@ -62,7 +63,7 @@ void Tools::Up() {
     if (!mIsDown) return;
     mIsDown = false;
     if (mPath) {
-        Stroke stroke{mPath->Finish(), GetInk(mTool, mColor)};
+        Stroke stroke{mPath->Finish(), GetInk()};
         mPath.reset();
         mPage.Append(std::make_shared<Object const>(std::move(stroke)));
     } else if (mTool != Tool::Select) {
@@ -184,13 +185,29 @@ void Tools::DeleteSelected() {
     mSelected.clear();
 }
 
-void Tools::Draw(IMKCanvas& canvas, double zoom, float ahead) const {
-    if (mPath) {
+// Opaque ink may lie over itself, so only what is new goes to the GPU. Translucent ink is one stroke, tail and all.
+void Tools::DrawLive(IMKCanvas& canvas, float ahead) {
+    if (!mLive) mLive = MakeInk(*canvas.GetMsgQueue());
+    if (!mTail) mTail = MakeInk(*canvas.GetMsgQueue());
+    MKPaint const paint = MakePaint(GetInk());
+    mTail->Clear();
+    if (mTool == Tool::Highlighter) {
         InkPoints points = mPath->GetSettled();
         InkPoints const tail = mPath->GetTail(ahead);
-        if (!tail.empty()) points.insert(points.end(), tail.begin() + 1, tail.end());
-        DrawInk(canvas, points, GetInk(mTool, mColor));
+        points.insert(points.end(), tail.begin() + 1, tail.end());
+        AppendInk(*mTail, points, 0);
+    } else {
+        if (mLiveCount == 0) mLive->Clear();
+        AppendInk(*mLive, mPath->GetSettled(), mLiveCount);
+        mLiveCount = mPath->GetSettled().size();
+        AppendInk(*mTail, mPath->GetTail(ahead), 0);
+        canvas.Draw(mLive.Get(), &paint);
     }
+    canvas.Draw(mTail.Get(), &paint);
+}
+
+void Tools::Draw(IMKCanvas& canvas, double zoom, float ahead) {
+    if (mPath) DrawLive(canvas, ahead);
     MKPaint line = MakePaint(kMark);
     line.SetLineWidth(std::max(1.0f, 1.5f / static_cast<float>(zoom)));
     for (std::size_t i = 1; i < mLasso.size(); ++i) canvas.DrawLine(mLasso[i - 1], mLasso[i], &line);

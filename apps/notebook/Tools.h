@@ -40,10 +40,7 @@ public:
     bool IsDragging() const { return mDrag != Drag::None; }
 
     // What is not on the tiles: the live stroke, on to `ahead` milliseconds from now, the lasso, the selection.
-    void Draw(IMKCanvas& canvas, double zoom, float ahead) const;
-
-    // Of the stroke that has just been written, so that it goes onto the tiles as it is.
-    static unsigned GetInk(Tool tool, unsigned color);
+    void Draw(IMKCanvas& canvas, double zoom, float ahead);
 
 private:
     enum class Drag { None, Move, Scale };
@@ -55,6 +52,8 @@ private:
     void EndDrag();
     RectF GetSelectedBounds() const;
     Placement GetPlacement() const;
+    unsigned GetInk() const;
+    void DrawLive(IMKCanvas& canvas, float ahead);
     void DrawSelection(IMKCanvas& canvas, double zoom) const;
 
     Page& mPage;
@@ -67,6 +66,9 @@ private:
     PointF mFirst;
     PointF mLast;
     std::optional<PenPath> mPath;
+    RefPtr<MKStrokeDrawable> mLive; // what is settled of it
+    RefPtr<MKStrokeDrawable> mTail; // and the rest, anew in each frame
+    std::size_t mLiveCount = 0;     // points
     std::vector<PointF> mLasso;
     Objects mSelected;
     Drag mDrag = Drag::None;
