@@ -16,7 +16,6 @@ namespace Moka::Testing {
 namespace {
 
 using ::testing::ElementsAre;
-using ::testing::IsEmpty;
 using ::testing::SizeIs;
 
 class BitmapDrawableTest : public DrawableFixture {
@@ -62,24 +61,8 @@ protected:
     std::optional<MKBitmapDrawable> drawable;
 };
 
-TEST_F(BitmapDrawableTest, TheCornersCarryTheCornersOfTheSource) {
-    EXPECT_TRUE(Draw(RectF(10, 20, 30, 28), MKPaint()));
-    EXPECT_THAT(VerticesOf(TakeDraw()),
-                ElementsAre(Vertex{10, 20, 1, 0.25f, 0.25f}, Vertex{10, 28, 1, 0.25f, 0.75f},
-                            Vertex{30, 20, 1, 0.75f, 0.25f}, Vertex{30, 20, 1, 0.75f, 0.25f},
-                            Vertex{10, 28, 1, 0.25f, 0.75f}, Vertex{30, 28, 1, 0.75f, 0.75f}));
-
-    MKPaint soft; // a fringe does not stretch the texture
-    soft.SetAntiAliasing(true);
-    EXPECT_TRUE(Draw(RectF(3.5f, 4, 12, 10.25f), soft));
-    std::vector<Vertex> const vertices = VerticesOf(TakeDraw());
-    EXPECT_THAT(vertices, SizeIs(30));
-    for (Vertex const& v : vertices) {
-        EXPECT_EQ(v[3], v[0] < 7 ? 0.25f : 0.75f);
-        EXPECT_EQ(v[4], v[1] < 7 ? 0.25f : 0.75f);
-    }
-
-    // A bitmap that does not lie at the origin: its left edge is added on the right.
+// Its left edge is added on the right.
+TEST_F(BitmapDrawableTest, ABitmapThatDoesNotLieAtTheOriginIsStretched) {
     RectF const bounds(10, 20, 18, 24);
     std::vector<RectF> const dsts = {RectF(0, 0, 5, 5)};
     EXPECT_TRUE(drawable->DrawBitmapRT(readable, bounds, bounds, RectF(12, 21, 16, 23), dsts[0], projection,
@@ -90,27 +73,6 @@ TEST_F(BitmapDrawableTest, TheCornersCarryTheCornersOfTheSource) {
         EXPECT_THAT(VerticesOf(shifted).front(), ElementsAre(0, 0, 1, 0.25f, 0.25f));
         EXPECT_THAT(VerticesOf(shifted).back(), ElementsAre(5, 5, 1, (16.0f + 10.0f) / 8.0f, 0.75f));
     }
-}
-
-TEST_F(BitmapDrawableTest, ABatchIsTheSameVerticesInOneDraw) {
-    std::vector<RectF> const dsts = {RectF(0, 0, 5, 5), RectF(30, 0, 20, 5), RectF(1, 2, 3, 4)};
-    for (bool antiAliased : {false, true}) {
-        MKPaint paint;
-        paint.SetAntiAliasing(antiAliased);
-        std::vector<float> expected;
-        for (RectF const& dst : dsts) {
-            EXPECT_TRUE(Draw(dst, paint));
-            std::vector<float> const one = TakeDraw().vertices;
-            expected.insert(expected.end(), one.begin(), one.end());
-        }
-        EXPECT_TRUE(DrawBatch(dsts, paint));
-        TracedDraw const batch = TakeDraw();
-        EXPECT_EQ(batch.count, antiAliased ? 90 : 18);
-        EXPECT_EQ(batch.vertices, expected);
-    }
-    // Nothing of the last batch is left over.
-    EXPECT_TRUE(DrawBatch({}, MKPaint()));
-    EXPECT_THAT(TakeDraw().vertices, IsEmpty());
 }
 
 TEST_F(BitmapDrawableTest, TheDrawUsesThePaintAndTheBitmapAndLeavesTheStencilAlone) {
@@ -132,20 +94,11 @@ TEST_F(BitmapDrawableTest, OnlyOneGpuGetsTheProgramThatClampsColors) {
     for (std::string const gpu : {"Mali-T830", "Mali-T830 MP2", "Mali-T83"}) {
         RendererTrace::SetGpuName(gpu.c_str());
         drawable.reset();
-        RendererTrace::TakeCalls();
         drawable.emplace(&queue);
-        char const* const program = gpu == "Mali-T830" ? "MKBitmapShaderColorClamp" : "MKBitmapShader";
-        std::vector<std::string> programs;
-        for (TracedCall const& call : RendererTrace::GetCalls()) {
-            if (call.operation == "Create" && call.object.rfind("program", 0) == 0)
-                programs.push_back(call.arguments);
-        }
-        EXPECT_THAT(programs, ElementsAre(program, "MKBitmapAdvancedBlendingShader"));
-        ForceOtherStates();
         EXPECT_TRUE(Draw(RectF(0, 0, 5, 5), CommonPaint()));
         EXPECT_TRUE(DrawBatch({RectF(0, 0, 5, 5)}, CommonPaint()));
         for (TracedDraw const& draw : TakeDraws()) {
-            EXPECT_EQ(draw.shader, program);
+            EXPECT_EQ(draw.shader, gpu == "Mali-T830" ? "MKBitmapShaderColorClamp" : "MKBitmapShader");
             ExpectCommonState(draw);
         }
     }
@@ -186,50 +139,6 @@ TEST_F(BitmapDrawableTest, DarkenAndLightenSampleACopyOfTheDestinationMadeOnceAS
     EXPECT_THAT(TakeTextureCalls(), ElementsAre("texture 2 Release", "texture 3 Create 101 50",
                                                 "texture 3 SetLabel " + tag + " 1",
                                                 "texture 3 CopyFromRenderTarget", "texture 3 Bind 1"));
-}
-
-TEST_F(BitmapDrawableTest, TheSizeOfTheDestinationIsSetBeforeTheTintsSwitch) {
-    MKPaint paint;
-    paint.SetXFermode(MKPaint::Darken);
-    Draw(RectF(0, 0, 5, 5), paint);
-    std::string values;
-    for (TracedCall const& call : RendererTrace::GetCalls())
-        if (call.operation == "SetParameter" && call.object == "program 2")
-            values += call.arguments.substr(0, call.arguments.find(' ') + 1);
-    EXPECT_EQ(values, "uProjectionMatrix uColor uTintColor uDstTextureSize uHasTintColor uBlendingMode "
-                      "uSrcTexture uDstTexture ");
-}
-
-TEST_F(BitmapDrawableTest, ItReleasesGeometryStatesProgramsAndCopyInThatOrder) {
-    MKPaint paint;
-    paint.SetXFermode(MKPaint::Darken);
-    Draw(RectF(0, 0, 5, 5), paint);
-    RendererTrace::TakeCalls();
-    drawable.reset();
-    EXPECT_THAT(TakeObjects("Release"), ElementsAre("graphics 1", "blend 1", "depthstencil 1", "program 1",
-                                                    "program 2", "texture 2"));
-}
-
-TEST_F(BitmapDrawableTest, WithoutACopyOfTheDestinationNothingIsDrawn) {
-    MKPaint paint;
-    paint.SetXFermode(MKPaint::Darken);
-    for (float const size : {kNaN, kInfinity, -kInfinity, 3e9f, 0.0f, 0.5f, -5.0f})
-        EXPECT_FALSE(Draw(RectF(0, 0, 5, 5), paint, RectF(0, 0, size, 10))) << size;
-    RendererTrace::FailCreations(ObjectKind::kTexture);
-    EXPECT_FALSE(Draw(RectF(0, 0, 5, 5), paint));
-    RendererTrace::StopFailing();
-    EXPECT_THAT(TakeDraws(), IsEmpty());
-    EXPECT_TRUE(Draw(RectF(0, 0, 5, 5), paint, RectF(0, 0, 20, 10)));
-}
-
-TEST_F(BitmapDrawableTest, BadInputDrawsNothingOrDoesNoHarm) {
-    std::vector<RectF> const dsts = {RectF(0, 0, kNaN, kInfinity)};
-    RectF const r(0, 0, 8, 4);
-    EXPECT_FALSE(drawable->DrawBitmapRT(nullptr, r, r, r, r, projection, MKPaint()));
-    EXPECT_FALSE(drawable->DrawBitmapsRT(nullptr, r, r, r, &dsts, projection, MKPaint()));
-    EXPECT_FALSE(drawable->DrawBitmapsRT(readable, r, r, r, nullptr, projection, MKPaint()));
-    EXPECT_THAT(TakeDraws(), IsEmpty());
-    EXPECT_TRUE(drawable->DrawBitmapsRT(readable, RectF(), r, dsts[0], &dsts, projection, MKPaint()));
 }
 
 } // namespace

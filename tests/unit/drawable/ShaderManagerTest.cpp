@@ -1,11 +1,9 @@
 #include "moka/graphics/drawable/ShaderExceptions.h"
-#include "tests/support/Allocation.h"
+#include "tests/support/Awaited.h"
 #include "tests/unit/drawable/ShaderFixture.h"
 
 #include <atomic>
 #include <chrono>
-#include <cstdlib>
-#include <new>
 #include <thread>
 
 namespace Moka::Testing {
@@ -86,20 +84,6 @@ TEST_F(ShaderManagerTest, GivingBackWhatIsNotTheManagersChangesNothing) {
     EXPECT_EQ(CountPrograms(), 0);
 }
 
-TEST_F(ShaderManagerTest, RemovingForgetsTheShaderWithoutDestroyingIt) {
-    auto* const shader = manager.GetShader<MKRectShader>();
-    log.Clear();
-    manager.RemoveShader(ShaderManager::Key("no such class"));
-    EXPECT_EQ(manager.GetShader<MKRectShader>(), shader);
-    manager.RemoveShader(ShaderManager::Key(typeid(MKRectShader).name()));
-    EXPECT_THAT(log.GetTexts(), IsEmpty());
-    EXPECT_EQ(CountPrograms(), 1);
-    auto* const next = manager.GetShader<MKRectShader>();
-    EXPECT_NE(next, shader);
-    manager.ReleaseShader(next);
-    delete shader;
-}
-
 TEST_F(ShaderManagerTest, AWrongTypeStopsTheConstructionAndLeavesNoEntry) {
     auto* const bystander = manager.GetShader<MKCircleShader>();
     for (int attempt = 0; attempt < 2; ++attempt) {
@@ -129,57 +113,6 @@ TEST_F(ShaderManagerTest, AWrongTypeStopsTheConstructionAndLeavesNoEntry) {
     expectedAlive += 2;
 }
 
-struct NoMemoryShader {
-    NoMemoryShader() { ADD_FAILURE() << "constructed in no memory"; }
-    static void* operator new(std::size_t, std::nothrow_t const&) noexcept { return nullptr; }
-    static void operator delete(void* memory) { ::operator delete(memory); }
-};
-
-TEST_F(ShaderManagerTest, WithoutMemoryTheEntryIsThereAndTheShaderIsNull) {
-    EXPECT_EQ(manager.GetShader<NoMemoryShader>(), nullptr);
-    log.Clear();
-    EXPECT_EQ(manager.GetShader<NoMemoryShader>(), nullptr);
-    EXPECT_THAT(log.GetTexts(), IsEmpty());
-    manager.RemoveShader(ShaderManager::Key(typeid(NoMemoryShader).name()));
-}
-
-// Has memory of its own, so that only the manager runs out of it.
-struct FrugalShader {
-    FrugalShader() { ++alive; }
-    ~FrugalShader() { --alive; }
-    static void* operator new(std::size_t size, std::nothrow_t const&) noexcept { return std::malloc(size); }
-    static void operator delete(void* memory) { std::free(memory); }
-    static inline int alive = 0;
-};
-
-TEST_F(ShaderManagerTest, WithoutMemoryForTheEntryThereIsNeitherItNorAShader) {
-    FrugalShader* shader = nullptr;
-    EXPECT_NO_THROW({
-        FailAllocations const noMemory;
-        shader = manager.GetShader<FrugalShader>();
-    });
-    EXPECT_EQ(shader, nullptr);
-    EXPECT_EQ(FrugalShader::alive, 0);
-    shader = manager.GetShader<FrugalShader>();
-    EXPECT_NE(shader, nullptr);
-    manager.ReleaseShader(shader);
-    EXPECT_EQ(FrugalShader::alive, 0);
-}
-
-TEST_F(ShaderManagerTest, AMistakeIsToldInNoMemoryAsWell) {
-    std::string told;
-    told.reserve(100);
-    EXPECT_NO_THROW({
-        FailAllocations const noMemory;
-        try {
-            ParameterBinding<BindingTypeInt>() = 1;
-        } catch (NotSupportedException const& error) {
-            told = error.what();
-        }
-    });
-    EXPECT_EQ(told, "ParameterBinding: internal interface is not initialized!");
-}
-
 struct SlowShader {
     SlowShader() {
         ++made;
@@ -196,12 +129,13 @@ TEST(ShaderManagerThreadsTest, UsersOnManyThreadsNeverMeetTwoOfAClass) {
     ShaderManager& manager = *ShaderManager::GetInstance();
     for (int round = 0; round < 5; ++round) {
         int const before = SlowShader::made;
-        std::atomic<int> waiting{4};
-        std::vector<std::thread> users;
+        Awaited<int> users;
+        std::vector<std::thread> threads;
         for (int i = 0; i < 4; ++i) {
-            users.emplace_back([&] {
+            threads.emplace_back([&] {
                 SlowShader* const mine = manager.GetShader<SlowShader>();
-                for (--waiting; waiting > 0;) std::this_thread::yield();
+                ++users;
+                users.AwaitAtLeast(4);
                 for (int j = 0; j < 50; ++j) {
                     EXPECT_EQ(manager.GetShader<SlowShader>(), mine);
                     EXPECT_EQ(SlowShader::alive, 1);
@@ -210,7 +144,7 @@ TEST(ShaderManagerThreadsTest, UsersOnManyThreadsNeverMeetTwoOfAClass) {
                 manager.ReleaseShader(mine);
             });
         }
-        for (std::thread& user : users) user.join();
+        for (std::thread& thread : threads) thread.join();
         EXPECT_EQ(SlowShader::made, before + 1);
         EXPECT_EQ(SlowShader::alive, 0);
     }

@@ -47,7 +47,6 @@ TEST_F(ShadersTest, AssignedValuesReachTheProgramAndMissingUniformsSwallowThem) 
         shader.count = -3;
         (shader.texture = 1) = 2; // the assignment gives the binding back
         shader.missing = Vector4<float>();
-        EXPECT_EQ(RendererTrace::GetCurrentProgram(), "program 1");
         auto const value = [&](char const* name) {
             return RendererTrace::GetParameter(shader.program, name);
         };
@@ -61,35 +60,10 @@ TEST_F(ShadersTest, AssignedValuesReachTheProgramAndMissingUniformsSwallowThem) 
         EXPECT_EQ(RendererTrace::CountCalls("SetParameter"), 9);
         RendererTrace::TakeCalls();
     }
-    EXPECT_EQ(RendererTrace::GetCurrentProgram(), "none");
     std::vector<std::string> const calls = RendererTrace::TakeCalls(); // backwards
     EXPECT_EQ(calls.front(), "program 1 Release");
     EXPECT_EQ(calls.back(), "program 1 ReleaseParameter flag");
     EXPECT_THAT(log.GetTexts(), IsEmpty());
-}
-
-TEST_F(ShadersTest, AssigningToWhatWasNeverBoundOrFailedToBindThrows) {
-    EveryKindShader shader;
-    ParameterBinding<BindingTypeFloat> binding;
-    for (bool failed : {false, true}) {
-        if (failed) {
-            binding.bind(shader.program, "number");
-            // Rebinding gives the handle up, and fails.
-            EXPECT_THROW(binding.bind(shader.program, "count"), InvalidArgumentException);
-        }
-        log.Clear();
-        try {
-            binding = 1.0f;
-            ADD_FAILURE() << "nothing thrown";
-        } catch (std::exception const& e) {
-            EXPECT_NE(dynamic_cast<NotSupportedException const*>(&e), nullptr);
-            EXPECT_STREQ(e.what(), "ParameterBinding: internal interface is not initialized!");
-        }
-        EXPECT_THAT(log.GetTexts(ANDROID_LOG_ERROR),
-                    ElementsAre("ParameterBinding: internal interface is not initialized!"));
-    }
-    EXPECT_EQ(RendererTrace::CountCalls("SetParameter"), 0);
-    EXPECT_EQ(RendererTrace::CountCalls("ReleaseParameter"), 2);
 }
 
 // Where a mediump float has 16 bits a place above 1024 is known to a whole unit, and a wide bitmap skips texels.
