@@ -1,6 +1,5 @@
 #include "moka/base/Bitmap.h"
 #include "moka/base/String.h"
-#include "tests/support/Allocation.h"
 #include "tests/unit/codec/CodecTestSupport.h"
 
 #include <algorithm>
@@ -76,26 +75,6 @@ TEST(RoundTrip, HonoursAStrideWiderThanTheRow) {
     }
 }
 
-TEST(RoundTrip, InfoTellsTheHeaderWithoutThePixels) {
-    TempFolder const folder;
-    for (bool const isOpaque : {true, false}) {
-        Picture const image = MakeGradient(300, 200, isOpaque);
-        for (char const* extension : {"png", "webp", "mki", "jpg"}) {
-            std::string const path = SaveIn(folder, image, extension);
-            Bytes bytes = ReadBytes(path);
-            std::string const kind = extension;
-            // "mki" states the payload's length in its header, so there a short file is known at once.
-            if (kind != "mki") bytes.resize(bytes.size() / 2);
-            WriteBytes(path, bytes);
-            ImageInfo const info = GetInfo(path);
-            EXPECT_EQ(info.width, 300);
-            EXPECT_EQ(info.height, 200);
-            EXPECT_EQ(info.hasAlpha, kind == "mki" || (kind != "jpg" && !isOpaque)) << extension;
-            EXPECT_EQ(info.fileBytes, bytes.size());
-        }
-    }
-}
-
 TEST(RoundTrip, ContentDecidesWhenReadingAndTheExtensionWhenWriting) {
     TempFolder const folder;
     Picture const image = MakeOpaqueNoise(9, 9);
@@ -118,31 +97,6 @@ TEST(RoundTrip, ContentDecidesWhenReadingAndTheExtensionWhenWriting) {
     for (char const* name : {"x.gif", "png", "x.", "x.png/y", "x.pngx", ""}) {
         String const text(name);
         EXPECT_EQ(BitmapFactory::GetFormatByExtension(&text), ImageFormat::Unknown) << name;
-    }
-}
-
-TEST(RoundTrip, DecodingHoldsOneCopyOfThePixels) {
-    TempFolder const folder;
-    constexpr std::size_t kSide = 768;
-    constexpr std::size_t kFull = kSide * kSide * 4;
-    constexpr std::size_t kSlack = 128 * 1024;                // a block of the file, rows, weights
-    Picture const image = MakeTranslucentNoise(kSide, kSide); // hardly compresses
-    for (char const* extension : {"png", "webp", "mki", "jpg"}) {
-        std::string const path = SaveIn(folder, image, extension);
-        String const text(path);
-        std::size_t const before = ArrayMemory::GetLive();
-        auto const peakOf = [&](int side) {
-            ArrayMemory::ResetPeak();
-            delete BitmapFactory::CreateBitmap(&text, side, side);
-            EXPECT_EQ(ArrayMemory::GetLive(), before) << extension;
-            return ArrayMemory::GetPeak() - before;
-        };
-        EXPECT_GE(peakOf(kSide), kFull) << extension;
-        EXPECT_LE(peakOf(kSide), kFull + kSlack) << extension;
-        // Scaled, only the result is held; JPEG decodes to the next eighth and shrinks that within its
-        // memory.
-        EXPECT_LE(peakOf(kSide / 8), kFull / 64 + kSlack) << extension;
-        EXPECT_LE(peakOf(kSide * 5 / 8 - 3), kFull * 25 / 64 + kSlack) << extension;
     }
 }
 

@@ -116,14 +116,5 @@ TEST(Save, GoesThroughSymbolicLinksToTheFileBehind) {
     EXPECT_EQ(DecodeFile(folder.Path("album/made")), image);
 }
 
-TEST(Save, APathWithoutAFolderMeansTheCurrentOne) {
-    TempFolder const folder;
-    std::filesystem::path const before = std::filesystem::current_path();
-    std::filesystem::current_path(folder.Path(""));
-    EXPECT_TRUE(SaveImage(MakeOpaqueNoise(5, 5), "page.mki"));
-    std::filesystem::current_path(before);
-    EXPECT_THAT(folder.List(), ElementsAre("page.mki"));
-}
-
 } // namespace
 } // namespace Moka::Testing

@@ -82,19 +82,6 @@ TEST_F(Save, WhatCannotBeWrittenIsAnErrorAndTheLoopGoesOn) {
     EXPECT_EQ(log.Count(ANDROID_LOG_INFO, "BitmapLoaderImpl::SaveBitmap error bitmap construct fail"), 4);
 }
 
-TEST_F(Save, WithoutAListenerTheFileIsWrittenAndWithoutPixelsItIsRefused) {
-    EXPECT_TRUE(Loader().RequestSave(nullptr, 1, Path("s.png"), NewPixels(image), 40, 30, nullptr, 100));
-    EXPECT_FALSE(Loader().RequestSave(&listener, 1, Path("s.png"), nullptr, 40, 30, nullptr, 100));
-    HeldBitmap noWidth(0, 5);
-    HeldBitmap noHeight(5, 0);
-    EXPECT_FALSE(Loader().RequestSave(&listener, 1, Path("s.png"), noWidth, nullptr, 100));
-    EXPECT_FALSE(Loader().RequestSave(&listener, 1, Path("s.png"), noHeight, nullptr, 100));
-    Loader().WaitForAllSaveRequestsToEnd();
-    EXPECT_EQ(ReadBytes("s.png"), EncodedDirectly("png"));
-    EXPECT_EQ(
-        log.Count(ANDROID_LOG_INFO, "BitmapLoaderImpl::SaveBitmap queue size(0). callback for request["), 1);
-}
-
 TEST_F(Save, WhatABitmapDoesNotCoverIsTransparent) {
     Picture const whole = MakeGradient(8, 8);
     auto const bitmap = RefPtr<IMKBitmap>::Adopt(
@@ -164,23 +151,6 @@ TEST_F(Save, ALoadQueuedBehindASaveReadsWhatItWrote) {
     Loader().RequestLoad(&listener, 2, Path("s.mki"), detail::BITMAP_TYPE_CPU, queue.get(), 0, 0);
     listener.AwaitCompleted(2);
     EXPECT_EQ(listener.GetResults(), (Events{"save 1", "load 2 40x30"}));
-}
-
-TEST_F(Save, ARequestThatMemoryRunsOutForIsRefusedAndLeavesThePixels) {
-    String const path = Path("s.png");
-    HeldBitmap bitmap(4, 3);
-    auto* const pixels = NewPixels(image);
-    int accepted = 0;
-    {
-        FailAllocations const fail;
-        accepted += Loader().RequestSave(&listener, 1, path, pixels, 40, 30, nullptr, 100);
-        accepted += Loader().RequestSave(&listener, 1, path, bitmap, nullptr, 100);
-        accepted += Loader().RequestLoad(&listener, 1, path, detail::BITMAP_TYPE_CPU, nullptr, 0, 0);
-    }
-    EXPECT_EQ(accepted, 0);
-    delete[] pixels;
-    Loader().WaitForAllSaveRequestsToEnd();
-    EXPECT_EQ(listener.GetEvents(), Events{});
 }
 
 } // namespace
