@@ -213,19 +213,6 @@ TEST(TraceTest, NothingIsLostWhenTheProcessEndsWithoutStopping) {
     EXPECT_EQ(events.Sum("task", "DrawRectRT", "count"), 200);
 }
 
-TEST(TraceTest, AFileThatCannotBeWrittenIsOneWarningAndTheProgramGoesOn) {
-    for (auto const& [path, reason] : {std::pair<std::string, char const*>{"/nowhere/t.json", "No such file"},
-                                       {"/dev/full", "No space left"}}) {
-        LogCapture const log;
-        RenderThreadOptions options;
-        options.tracePath = path;
-        auto const queue = RenderThread::Start(options, nullptr);
-        ASSERT_TRUE(queue);
-        Work(*queue, 10);
-        EXPECT_THAT(log.GetTexts(ANDROID_LOG_WARN), ElementsAre(AllOf(HasSubstr(path), HasSubstr(reason))));
-    }
-}
-
 TEST(TraceTest, WhenTheDiskFillsTheEventsBeforeCanStillBeRead) {
     std::string const path = MakePath(".json");
     auto const run = [&path] {
