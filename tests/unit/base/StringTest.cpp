@@ -107,14 +107,5 @@ TEST(StringTest, FindsTheLastOccurrence) {
     for (auto const& [part, at] : cases) EXPECT_EQ(String("a.tar.gz").ReverseFind(part), at) << part;
 }
 
-TEST(StringTest, ComparesByUnitAndByCase) {
-    EXPECT_EQ(String("png"), String("png"));
-    EXPECT_GT(String("png").CompareTo("PNG"), 0);
-    EXPECT_LT(String("PNG").CompareTo("png"), 0);
-    EXPECT_LT(String("pn").CompareTo("png"), 0);
-    EXPECT_GT(FromUnits(u"\uff00").CompareTo(FromUnits(u"a")), 0) << "units are unsigned";
-    EXPECT_NE(String("png"), String("PNG"));
-}
-
 } // namespace
 } // namespace Moka

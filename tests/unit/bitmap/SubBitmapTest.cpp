@@ -83,23 +83,6 @@ TEST_F(SubBitmap, ReadsAPixelByItsOwnOddBounds) {
     EXPECT_EQ(row, Pixels(pixels.begin() + 12 * 16, pixels.begin() + 13 * 16)) << "rectangles know better";
 }
 
-TEST_F(SubBitmap, AsynchronousReadsCallBackEvenWhenThereIsNothingToRead) {
-    RendererTrace::FailCreations(ObjectKind::kTexture);
-    auto strip = MakeStrip(&queue, Rect(0, 0, 4, 4));
-    Seen seen;
-    Pixels untouched(64, 9);
-    strip->GetPixelAsync(Point(1, 1), &seen, Seen::OnPixel);
-    strip->GetBitmapDataAsync(Rect(0, 0, 4, 4), untouched.data(), &seen, Seen::OnData);
-    EXPECT_EQ(seen.calls, 0);
-    queue.RunAll();
-    RendererTrace::StopFailing();
-    EXPECT_EQ(seen.calls, 2);
-    EXPECT_EQ(seen.pixel, 0u);
-    EXPECT_EQ(seen.rect, Rect(0, 0, 4, 4));
-    EXPECT_EQ(seen.destination, untouched.data());
-    EXPECT_EQ(untouched, Pixels(64, 9));
-}
-
 // Says at once that it has caught up, as every queue does on its own thread.
 class HastyQueue final : public HandPumpedQueue {
 public:

@@ -95,22 +95,6 @@ TEST_F(TextureBitmap, CanvasesHoldItAndItsFrameBuffers) {
     EXPECT_EQ(CountOf(bitmap.Get()), 1) << "the canvas's and the task's";
 }
 
-TEST_F(TextureBitmap, AnEmptyBitmapDoesNothingAndSurvivesEverything) {
-    auto const bitmap = BitmapPtr::Adopt(
-        MKGraphicsFactory::CreateBitmap(&queue, reinterpret_cast<TextureObject const*>(this), 1));
-    EXPECT_EQ(bitmap->GetBitmapRect(), Rect());
-    EXPECT_EQ(bitmap->GetPixel(Point(0, 0)), 0u);
-    Seen seen;
-    bitmap->GetBitmapDataAsync(Rect(0, 0, 1, 1), nullptr, &seen, Seen::OnData);
-    bitmap->GetBitmapWritable()->ActivateFrameBuffer();
-    bitmap->GetBitmapReadable()->SetTextureFilter(TextureFilterLinear);
-    bitmap->GetBitmapCanvasAttachable()->AttachToCanvas();
-    bitmap->GetBitmapCanvasAttachable()->DetachFromCanvas();
-    EXPECT_EQ(bitmap->GetBitmapWritable()->GetProjectionMatrix(), Matrix4<float>());
-    EXPECT_EQ(queue.RunAll(), 0);
-    EXPECT_EQ(seen.calls, 0);
-}
-
 TEST_F(TextureBitmap, TheTagReachesEveryStripAndIsCut) {
     auto const bitmap = NewBitmap(4, 2 * kMaxSide);
     bitmap->SetTag(std::string(200, 't').c_str());

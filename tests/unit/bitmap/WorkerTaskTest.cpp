@@ -1,8 +1,6 @@
 // Tasks: what they store, what they call, who frees them.
 #include "moka/graphics/task/WorkerTask.h"
 
-#include "moka/base/Rect.h"
-#include "moka/base/RefCount.h"
 #include "moka/renderer/IRenderTarget.h"
 #include "moka/renderer/IRendererDeviceCaps.h"
 #include "tests/support/Queues.h"
@@ -10,12 +8,10 @@
 #include <cstdint>
 #include <cstring>
 #include <gtest/gtest.h>
-#include <string>
 
 namespace Moka {
 namespace {
 
-using Testing::HandPumpedQueue;
 using Testing::RefusingQueue;
 
 // Counts the living ones, copies among them.
@@ -42,28 +38,6 @@ TEST(WorkerTask, ARefusedTaskIsFreedAndNeverRuns) {
     EXPECT_EQ(Tracked::alive, 0);
     EXPECT_EQ(target.runs, 0);
     EXPECT_EQ(queue.GetRefusedCount(), 1);
-}
-
-struct Mortal {
-    static inline int deleted = 0;
-    virtual ~Mortal() { ++deleted; }
-};
-
-TEST(WorkerTask, DeletionsHappenWhenRunAndOnlyThen) {
-    Mortal::deleted = 0;
-    Mortal stays;
-    {
-        HandPumpedQueue queue;
-        WorkerTask::PostDelete(&queue, new Mortal);
-        WorkerTask::PostDelete(&queue, static_cast<Mortal*>(nullptr));
-        WorkerTask::PostDeleteArray(&queue, static_cast<unsigned char const*>(new unsigned char[16]));
-        WorkerTask::PostDeleteArray(&queue, static_cast<unsigned char const*>(nullptr));
-        EXPECT_EQ(Mortal::deleted, 0);
-        queue.RunAll();
-        EXPECT_EQ(Mortal::deleted, 1);
-        WorkerTask::PostDelete(&queue, &stays); // never run
-    }
-    EXPECT_EQ(Mortal::deleted, 1) << "a task that never ran leaves its object alive";
 }
 
 // Where a virtual function stands in its table: in the Itanium ABI a pointer to one holds its offset plus

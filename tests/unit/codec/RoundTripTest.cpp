@@ -60,18 +60,14 @@ TEST(RoundTrip, LossyFormatsComeClose) {
 }
 
 TEST(RoundTrip, HonoursAStrideWiderThanTheRow) {
-    Picture const image = MakeTranslucentNoise(37, 11);
-    constexpr int kStride = 37 * 4 + 20;
-    Bytes padded(kStride * 11, 0xEE);
-    for (int y = 0; y < 11; ++y) std::copy_n(image.At(0, y), 37 * 4, padded.begin() + y * kStride);
-    Bitmap bitmap;
-    ASSERT_TRUE(bitmap.Construct(padded.data(), 37, 11, kStride, 1, false, false));
     TempFolder const folder;
-    for (char const* extension : {"png", "webp", "mki", "jpg"}) {
-        std::string const path = folder.Path(std::string("padded.") + extension);
-        String const text(path);
-        ASSERT_TRUE(BitmapFactory::SaveBitmap(&bitmap, &text, 100));
-        EXPECT_EQ(ReadBytes(path), Encode(image, extension)) << extension;
+    Picture wide = MakeTranslucentNoise(42, 11);
+    Bitmap bitmap;
+    ASSERT_TRUE(bitmap.Construct(wide.pixels.data(), 37, 11, 42 * 4, 1, false, false));
+    for (char const* name : {"a.png", "a.webp", "a.mki"}) {
+        String const path(folder.Path(name));
+        ASSERT_TRUE(BitmapFactory::SaveBitmap(&bitmap, &path, 100));
+        EXPECT_EQ(DecodeFile(folder.Path(name)), wide.Crop(0, 0, 37, 11)) << name;
     }
 }
 

@@ -51,19 +51,6 @@ TEST(RowScaler, IsTheRoundedReferenceForEveryMixOfShrinkingAndGrowing) {
     }
 }
 
-TEST(RowScaler, ShrinksWithinTheMemoryOfItsSource) {
-    Picture const source = MakeTranslucentNoise(20, 13);
-    for (PixelSize const to :
-         {PixelSize{20, 13}, PixelSize{19, 12}, PixelSize{20, 12}, PixelSize{3, 13}, PixelSize{7, 5}}) {
-        Bytes memory = source.pixels;
-        detail::RowScaler scaler({20, 13}, to, memory.data());
-        for (int y = 0; y < 13; ++y) scaler.Push(memory.data() + y * 80);
-        Bytes const expected = Scale(source, to.width, to.height).pixels;
-        memory.resize(expected.size());
-        EXPECT_EQ(memory, expected) << to.width << " x " << to.height;
-    }
-}
-
 // Formats without a scaler of their own give exactly what ours gives. A scaled JPEG covers whole blocks, 152
 // rows here instead of 150, which shifts the far edge by a part of a pixel.
 TEST(ScaledDecode, EveryFormatHasTheExactSizeAndTheScalersPixelsOrClose) {

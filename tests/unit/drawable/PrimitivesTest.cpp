@@ -1,5 +1,5 @@
-// Rectangles, round rectangles, circles and lines: what is drawn at all, and with what. What their vertices
-// cover is seen in the pictures.
+// Rectangles, round rectangles, circles and lines: what they are drawn with. What they cover is seen in the
+// pictures.
 #include "moka/graphics/drawable/MKCircleDrawable.h"
 #include "moka/graphics/drawable/MKLineDrawable.h"
 #include "moka/graphics/drawable/MKRectDrawable.h"
@@ -15,63 +15,15 @@ namespace {
 
 using ::testing::SizeIs;
 
-class PrimitivesTest : public DrawableFixture {
-protected:
-    static MKPaint Paint(MKPaint::Style style, float width, bool antiAliased) {
-        MKPaint paint;
-        paint.SetStyle(style);
-        paint.SetLineWidth(width);
-        paint.SetAntiAliasing(antiAliased);
-        return paint;
-    }
-};
-
-TEST_F(PrimitivesTest, StylesAndWidthsDecideWhatIsDrawn) {
-    constexpr auto kUnknown = static_cast<MKPaint::Style>(3);
-    struct {
-        MKPaint paint;
-        std::vector<int> rect, roundRect, circle; // the vertices of each draw
-    } const cases[] = {
-        {Paint(MKPaint::Fill, 9, false), {6}, {42, 24}, {6}},
-        {Paint(MKPaint::Fill, 9, true), {30}, {42, 24}, {6}},
-        {Paint(MKPaint::Stroke, 1, false), {24}, {72, 24}, {6}},
-        {Paint(MKPaint::Stroke, 1, true), {72}, {72, 24}, {6}},
-        {Paint(MKPaint::FillAndStroke, 2, true), {102}, {42, 24, 72, 24}, {6, 6}},
-        {Paint(MKPaint::FillAndStroke, 0.99f, false), {6}, {42, 24}, {6, 6}},
-        {Paint(MKPaint::Stroke, 0.99f, true), {0}, {}, {6}},
-        {Paint(MKPaint::Stroke, 0, true), {0}, {}, {}},
-        {Paint(MKPaint::Stroke, kNaN, true), {0}, {}, {}},
-        {Paint(kUnknown, 4, true), {0}, {}, {}},
-    };
-    auto const takeCounts = [] {
-        std::vector<int> counts;
-        for (TracedDraw const& draw : TakeDraws()) counts.push_back(draw.count);
-        return counts;
-    };
-    MKRectDrawable rect;
-    MKRoundRectDrawable roundRect;
-    MKCircleDrawable circle;
-    for (auto const& c : cases) {
-        SCOPED_TRACE(&c - cases);
-        EXPECT_TRUE(rect.DrawRectRT(RectF(2, 2, 12, 12), projection, c.paint));
-        EXPECT_EQ(takeCounts(), c.rect);
-        EXPECT_TRUE(roundRect.DrawRoundRectRT(RectF(2, 2, 12, 12), 2, 2, projection, c.paint));
-        EXPECT_EQ(takeCounts(), c.roundRect);
-        circle.DrawCircleRT(PointF(20, 30), 5, projection, c.paint);
-        EXPECT_EQ(takeCounts(), c.circle);
-    }
-    // Radii are clamped from above only.
-    roundRect.DrawRoundRectRT(RectF(0, 0, 20, 10), 10.5f, -3, projection, MKPaint());
-    EXPECT_EQ(Values(TakeDraws().at(1), {"uRxry"}), "10 -3");
-    roundRect.DrawRoundRectRT(RectF(0, 0, 20, 10), 3, 5.5f, projection, MKPaint());
-    EXPECT_EQ(Values(TakeDraws().at(1), {"uRxry"}), "3 5");
-}
+using PrimitivesTest = DrawableFixture;
 
 TEST_F(PrimitivesTest, ThePointsAreFreedUnlessTheLineIsTooThin) {
     auto const isFreed = [&](MKLineDrawable& drawable, std::size_t count, float width) {
         auto points = std::make_unique<std::vector<PointF>>(count);
         DeleteWatch const watch(points.get());
-        drawable.DrawSimpleLinesRT(points.get(), projection, Paint(MKPaint::Fill, width, true));
+        MKPaint paint;
+        paint.SetLineWidth(width);
+        drawable.DrawSimpleLinesRT(points.get(), projection, paint);
         bool const freed = watch.GetPlainDeletes() == 1;
         if (freed) static_cast<void>(points.release());
         return freed;

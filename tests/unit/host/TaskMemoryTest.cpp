@@ -6,12 +6,9 @@
 #include <gtest/gtest.h>
 
 #include <algorithm>
-#include <array>
 #include <cstdint>
 #include <cstring>
-#include <new>
 #include <set>
-#include <stdexcept>
 #include <thread>
 #include <vector>
 
@@ -124,27 +121,6 @@ TEST(TaskMemoryTest, AThreadThatIsBeingTornDownGetsBlocksAndGivesThemBack) {
     ASSERT_FALSE(seen.empty());
 #if !defined(__SANITIZE_ADDRESS__)
     EXPECT_LE(seen.size(), 2u * detail::kTaskBatch);
-#endif
-}
-
-template <std::size_t kBytes>
-struct ThrowingTask : ITask {
-    ThrowingTask() { throw std::runtime_error("no"); }
-    void run() override {}
-    std::array<char, kBytes> payload;
-};
-
-// The memory must come back, which the leak sanitizer sees, and the next one of that size gets it.
-TEST(TaskMemoryTest, ATaskWhoseConstructorThrowsGivesItsMemoryBack) {
-    EXPECT_THROW((void)new (std::nothrow) ThrowingTask<100>, std::runtime_error);
-    EXPECT_THROW((void)new (std::nothrow) ThrowingTask<1000>, std::runtime_error);
-#if !defined(__SANITIZE_ADDRESS__)
-    void* const before = AllocateTask(sizeof(ThrowingTask<100>));
-    FreeTask(before, sizeof(ThrowingTask<100>));
-    EXPECT_THROW((void)new (std::nothrow) ThrowingTask<100>, std::runtime_error);
-    void* const after = AllocateTask(sizeof(ThrowingTask<100>));
-    EXPECT_EQ(before, after);
-    FreeTask(after, sizeof(ThrowingTask<100>));
 #endif
 }
 

@@ -44,25 +44,10 @@ protected:
     RecordingListener listener;
 };
 
-TEST_F(Save, EveryFormatIsWrittenAsTheEncoderWouldAndUserDataComesBack) {
-    int count = 0;
-    for (std::string const extension : {"png", "jpg", "webp", "mki"}) {
-        EXPECT_TRUE(Request(count, "s." + extension, 60, &count));
-        Loader().WaitForAllSaveRequestsToEnd();
-        EXPECT_EQ(ReadBytes("s." + extension), EncodedDirectly(extension, 60)) << extension;
-        EXPECT_EQ(listener.userData, &count);
-        ++count;
-    }
-    EXPECT_EQ(listener.GetResults(), (Events{"save 0", "save 1", "save 2", "save 3"}));
-    EXPECT_EQ(listener.GetEvents().size(), 3 * 4u);
-}
-
 TEST_F(Save, WhatCannotBeWrittenIsAnErrorAndTheLoopGoesOn) {
     int count = 0;
     for (char const* name : {"s.unknown", "no folder/s.png"}) EXPECT_TRUE(Request(count++, name));
-    constexpr int kHuge = std::numeric_limits<int>::max();
-    std::pair<int, int> const sizes[] = {{0, 30}, {40, -1}, {kHuge, 1}, {kHuge, kHuge}};
-    for (auto const& [width, height] : sizes) {
+    for (auto const& [width, height] : {std::pair{40, -1}, {std::numeric_limits<int>::max(), 1}}) {
         EXPECT_TRUE(Loader().RequestSave(&listener, count++, Path("s.png"), NewPixels(image), width, height,
                                          nullptr, 100));
     }
@@ -79,7 +64,7 @@ TEST_F(Save, WhatCannotBeWrittenIsAnErrorAndTheLoopGoesOn) {
     EXPECT_TRUE(Request(count, "s.png"));
     listener.AwaitCompleted(count + 1);
     EXPECT_EQ(listener.GetResults(), expected);
-    EXPECT_EQ(log.Count(ANDROID_LOG_INFO, "BitmapLoaderImpl::SaveBitmap error bitmap construct fail"), 4);
+    EXPECT_EQ(log.Count(ANDROID_LOG_INFO, "BitmapLoaderImpl::SaveBitmap error bitmap construct fail"), 2);
 }
 
 TEST_F(Save, WhatABitmapDoesNotCoverIsTransparent) {
