@@ -40,18 +40,6 @@ TEST(SceneRegistry, EveryFileIsASceneWithANameOfItsOwnAndASentence) {
                                [](Scene const& a, Scene const& b) { return a.group < b.group; }));
 }
 
-TEST(SceneRegistry, CustomDrawablesAndInkAreRefusedWhereThereIsNoGpu) {
-    int count = 0;
-    for (Scene const& scene : GetScenes()) {
-        if (!scene.needsGpu) continue;
-        Paint(8, 8, [&](IMKCanvas& canvas, Scenes::SceneStage& stage) {
-            EXPECT_THROW(DrawScene(scene, canvas, stage), Scenes::SceneError) << scene.name;
-        });
-        ++count;
-    }
-    EXPECT_EQ(count, 5);
-}
-
 TEST(SceneRegistry, TallScenesHaveExactlyThreeStrips) {
     Scene odd;
     odd.height = 31;
