@@ -211,10 +211,4 @@ std::vector<GLint> GetViewport() {
     return viewport;
 }
 
-ColorMask GetColorMask() {
-    ColorMask mask;
-    glGetBooleanv(GL_COLOR_WRITEMASK, mask.data());
-    return mask;
-}
-
 } // namespace Moka::Testing

@@ -136,8 +136,6 @@ private:
 
 GLint GetInteger(GLenum name);
 std::vector<GLint> GetViewport();
-using ColorMask = std::array<GLboolean, 4>;
-ColorMask GetColorMask();
 
 // For tests with deferral and without.
 inline std::string GetDrawMode(::testing::TestParamInfo<bool> const& mode) {
