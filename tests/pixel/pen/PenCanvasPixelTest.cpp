@@ -166,6 +166,14 @@ TEST_P(PenCanvasPixel, TheScenesInkFillsItsPanelsAndNothingElse) {
     for (Rect const& outside :
          {Rect(151, 0, 189, 140), Rect(291, 0, 359, 140), Rect(190, 0, 480, 24), Rect(441, 0, 480, 140)})
         EXPECT_EQ(countInk(outside), 0);
+    // External code has ended: draws are joined again.
+    queue->Call([this] {
+        auto const next = NewCanvas(*queue, bitmap, UseFrom::RenderThread);
+        std::uint64_t const before = RendererFactory::GetStatistics().draws;
+        for (float const x : {1.0f, 9.0f}) next->DrawRect(x, 1, x + 5, 5, nullptr);
+        RendererFactory::Flush();
+        EXPECT_EQ(RendererFactory::GetStatistics().draws - before, GetParam() ? 1u : 2u);
+    });
 }
 
 // Each of these takes another way through the renderer: plain, blended, textured, clipped by the scissor,
