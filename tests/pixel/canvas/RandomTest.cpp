@@ -90,7 +90,7 @@ private:
         mPaint = MKPaint();
         mPaint.SetXFermode(mMode);
         mPaint.SetColor(Between(0, 1), Between(0, 1), Between(0, 1), Flip() ? 1 : Between(0, 1));
-        if (Below(5) == 0) mPaint.SetTintColor(Between(0, 1), Between(0, 1), Between(0, 1), 1);
+        if (Below(5) == 0) mPaint.SetTintColor(Between(0, 1), Between(0, 1), Between(0, 1), Between(0, 1));
         mPaint.SetAntiAliasing(Flip());
         mPaint.SetStyle(static_cast<MKPaint::Style>(Below(3)));
         mPaint.SetLineWidth(Between(1, 6));

@@ -1,6 +1,6 @@
 // Textures: sampling state of each view, labels, what is refused, and the driver's transfer state. Uploads, copies and
 // lifetimes are in RandomWorkTest.
-#include "tests/pixel/renderer/RendererFixture.h"
+#include "tests/pixel/renderer/DrawFixture.h"
 
 #include "moka/base/Rect.h"
 #include "moka/renderer/IRendererDeviceCaps.h"
@@ -12,19 +12,27 @@
 namespace Moka::Testing {
 namespace {
 
-class TextureTest : public RendererFixture {
+class SamplingTest : public DrawFixture {
 protected:
-    // What a texture bound to unit 0 shows at a texture coordinate, through a shader.
-    static Color Sample(ITextureObject& texture, float s, float t) {
-        HostFrameBuffer const frameBuffer(1, 1);
-        std::string const coordinate = std::to_string(s) + ", " + std::to_string(t);
-        RawQuad const quad(("color = texture(texel, vec2(" + coordinate + "));").c_str());
-        glViewport(0, 0, 1, 1);
-        texture.Bind(0);
-        quad.Draw();
-        return frameBuffer.Read().GetColor(0, 0);
+    // What a texture shows at a texture coordinate.
+    Color Sample(ITextureObject& bound, float s, float t) const {
+        Brush const sampler("precision highp float; uniform sampler2D texel; uniform vec2 place;\n"
+                            "void main() { gl_FragColor = texture2D(texel, place); }",
+                            "place");
+        std::array<float, 2> const place{s, t};
+        bound.Bind(0);
+        target->Activate();
+        sampler.program->MakeCurrent();
+        sampler.parameter->Set(place.data());
+        SetQuad(0, 0, 8, 8);
+        EXPECT_TRUE(quad->Draw(0, -1, 1));
+        Picture pixel(1, 1);
+        target->ReadPixels(3, 3, 1, 1, {pixel.pixels.data(), 1, 0, 0});
+        target->Deactivate(false, false);
+        return pixel.GetColor(0, 0);
     }
 };
+INSTANTIATE_TEST_SUITE_P(ImmediateAndDeferred, SamplingTest, ::testing::Bool(), GetDrawMode);
 
 // Two columns and two rows, all different.
 Picture Corners() {
@@ -32,7 +40,7 @@ Picture Corners() {
     return MakeImage(2, 2, kClear).With(0, 0, red).With(1, 0, green).With(0, 1, blue);
 }
 
-TEST_F(TextureTest, StorageIsSharedAndSamplingStateIsNot) {
+TEST_P(SamplingTest, StorageIsSharedAndSamplingStateIsNot) {
     TexturePtr model = MakeTexture(2, 2);
     TextureParameter const nearest[] = {{TextureParamFilteringMin, TextureFilterNearest},
                                         {TextureParamFilteringMag, TextureFilterNearest},
@@ -65,10 +73,12 @@ TEST_F(TextureTest, StorageIsSharedAndSamplingStateIsNot) {
     for (auto const& [id, value] : kRefused) model->SetParameter(id, value);
     EXPECT_EQ(TakeErrors().size(), std::size(kRefused));
     EXPECT_EQ(Sample(*model, 2.25f, 0.25f), kGreen);
-    EXPECT_EQ(RendererFactory::GetStatistics().textures, 1);
+    EXPECT_EQ(RendererFactory::GetStatistics().textures, 2); // with the target's
     model.reset();
-    EXPECT_EQ(Read(*view), Corners());
+    EXPECT_EQ(RendererFixture::Read(*view), Corners());
 }
+
+using TextureTest = RendererFixture;
 
 TEST_F(TextureTest, LabelsAreCopiedAtOnceAndReachTheDriver) {
     TexturePtr const texture = MakeTexture(2, 2);
