@@ -33,6 +33,7 @@ constexpr Entry kEntries[] = {
     {"bitmap-whole", SceneGroup::Bitmaps},
     {"bitmap-parts", SceneGroup::Bitmaps},
     {"bitmap-turned", SceneGroup::Bitmaps},
+    {"bitmap-scaled", SceneGroup::Bitmaps},
     {"bitmap-tiles", SceneGroup::Bitmaps},
     {"bitmap-tall", SceneGroup::Bitmaps, true},
     {"bitmap-batch", SceneGroup::Bitmaps},
