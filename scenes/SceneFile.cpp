@@ -35,6 +35,8 @@ struct Content {
 
     void Draw(IMKCanvas& canvas, SceneStage& stage) const {
         SceneBitmaps bitmaps;
+        bitmaps.queue = stage.GetQueue();
+        if (steps.needsGpu && !bitmaps.queue) throw SceneError("the scene draws on a GPU only");
         for (Picture const& picture : pictures) {
             bitmaps.push_back(RefPtr<IMKBitmap>::Adopt(stage.MakeBitmap(picture)));
             if (!bitmaps.back()) throw SceneError("there is no room for the scene's bitmaps");
@@ -152,6 +154,7 @@ Scene ReadScene(SceneValue const& root, std::string const& folder) {
     if (SceneValue const* const value = fields.Find("paints")) ReadPaints(*value, content->names.paints);
     content->steps = ReadSteps(fields.Get("operations"), content->names);
     fields.CheckAll();
+    scene.needsGpu = content->steps.needsGpu;
     scene.draw = [content](IMKCanvas& canvas, SceneStage& stage) { content->Draw(canvas, stage); };
     return scene;
 }
