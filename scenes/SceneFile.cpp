@@ -41,7 +41,8 @@ struct Content {
 
     void Draw(IMKCanvas& canvas, SceneStage& stage) const {
         SceneBitmaps bitmaps;
-        if (NeedsGpu() && !stage.GetQueue()) throw SceneError("the scene draws on a GPU only");
+        bitmaps.queue = stage.GetQueue();
+        if (NeedsGpu() && !bitmaps.queue) throw SceneError("the scene draws on a GPU only");
         for (ScenePicture const& one : pictures) {
             bitmaps.push_back(RefPtr<IMKBitmap>::Adopt(stage.MakeBitmap(one.picture)));
             if (!bitmaps.back()) throw SceneError("there is no room for the scene's bitmaps");
@@ -51,10 +52,11 @@ struct Content {
         steps.Play(canvas, bitmaps);
     }
 
-    // No two drivers filter alike.
+    // No two drivers filter mipmaps alike.
     bool NeedsGpu() const {
-        return std::any_of(pictures.begin(), pictures.end(),
-                           [](ScenePicture const& one) { return one.filter != TextureFilterLinear; });
+        return steps.needsGpu || std::any_of(pictures.begin(), pictures.end(), [](ScenePicture const& one) {
+                   return one.filter != TextureFilterLinear;
+               });
     }
 };
 

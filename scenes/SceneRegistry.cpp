@@ -48,6 +48,7 @@ constexpr Entry kEntries[] = {
     {"round-rect-styles", SceneGroup::RoundRectangles},
     {"round-rect-radii", SceneGroup::RoundRectangles},
     {"round-rect-matrices", SceneGroup::RoundRectangles},
+    {"strokes", SceneGroup::CustomDrawables},
     {"screen", SceneGroup::Screen},
 };
 
