@@ -1,8 +1,8 @@
 // Runs the fragments of the documentation, in its order, each with a new bitmap and canvas, and fails if a line of the
 // log has the priority of an error. Writes the pictures that the documentation's programs read.
 #include "moka/base/Trace.h"
-#include "moka/base/log/LogSink.h"
 #include "moka/base/log/AndroidLog.h"
+#include "moka/base/log/LogSink.h"
 #include "moka/graphics/MokaGraphics.h"
 #include "moka/host/RenderThread.h"
 
