@@ -273,7 +273,8 @@ TEST(SceneFormat, AMistakeInTheFileIsNamedWithItsPlace) {
         {"{\"size\": [16384, 16385]}", "1:10: size: more than 1 GiB of pixels"},
         {"{\"size\": [8, 6], \"operations\": {}}", "1:32: operations must be a list of operations"},
         {"{\"size\": [8, 6], \"operations\": [],\n\"backgroud\": 1}",
-         "2:14: backgroud is unknown; there are size, about, background, bitmaps, paints, operations"},
+         "2:14: backgroud is unknown; there are size, about, background, labels, bitmaps, paints, "
+         "operations"},
         // A column counts characters, and what is in a text is no structure.
         {"{\"about\": \"\u00e9\\\\\\\"{[,\", \"size\": true}", "1:31: size must be"},
         {"{\"size\": [8, 6],\n\"background\": \"#12345\"}", "2:15: background must be \"#RRGGBB\""},
