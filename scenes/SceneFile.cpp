@@ -169,12 +169,24 @@ void ReadSize(SceneFields& fields, Scene& scene) {
         throw SceneValueError(size, ": more than 1 GiB of pixels");
 }
 
+std::vector<SceneLabel> ReadLabels(SceneValue const& value) {
+    if (value.kind != Kind::List) ThrowExpected(value, "a list of labels");
+    std::vector<SceneLabel> labels;
+    for (SceneValue const& item : value.items) {
+        SceneFields fields(item);
+        labels.push_back({fields.GetPoint("at"), ReadText(fields.Get("text"))});
+        fields.CheckAll();
+    }
+    return labels;
+}
+
 Scene ReadScene(SceneValue const& root, std::string const& folder) {
     SceneFields fields(root);
     Scene scene;
     ReadSize(fields, scene);
     if (SceneValue const* const value = fields.Find("about")) scene.about = ReadText(*value);
     if (SceneValue const* const value = fields.Find("background")) scene.background = ReadColor(*value);
+    if (SceneValue const* const value = fields.Find("labels")) scene.labels = ReadLabels(*value);
     auto const content = std::make_shared<Content>();
     if (SceneValue const* const value = fields.Find("bitmaps")) ReadBitmaps(*value, folder, *content);
     if (SceneValue const* const value = fields.Find("paints")) ReadPaints(*value, content->names.paints);

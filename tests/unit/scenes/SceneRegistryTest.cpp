@@ -28,8 +28,8 @@ TEST(SceneRegistry, EveryFileIsASceneWithANameOfItsOwnAndASentence) {
         EXPECT_TRUE(names.insert(scene.name).second);
         EXPECT_THAT(scene.name, MatchesRegex("[a-z0-9-]+"));
         EXPECT_THAT(scene.about, MatchesRegex("[A-Z].*\\."));
-        EXPECT_LE(scene.width, 640);
-        EXPECT_LE(scene.height, 720);
+        EXPECT_LE(scene.width, 1280);
+        EXPECT_LE(scene.height, 800);
         EXPECT_EQ(Scenes::FindScene(scene.name), &scene);
     }
     for (std::size_t i = 0; i < Scenes::kSceneTextCount; ++i)
