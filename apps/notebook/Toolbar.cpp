@@ -5,7 +5,7 @@
 namespace Moka::Notebook {
 namespace {
 
-constexpr unsigned kColors[] = {0x1B2A41, 0xC0392B, 0x1F77B4, 0x2E8B57, 0xE8A030, 0x8E44AD};
+constexpr unsigned kColors[] = {0x1B2A41, 0xC0392B, 0x1F77B4, 0x2E8B57, 0xF5D020, 0xE8A030, 0x8E44AD};
 constexpr float kWidths[] = {1.5f, 3, 6};
 constexpr unsigned kInk = 0xFF33404F;
 constexpr unsigned kFaint = 0xFFB4BDC8;
@@ -71,7 +71,7 @@ Toolbar::Toolbar() {
     for (Tool const tool : {Tool::Pen, Tool::Highlighter, Tool::StrokeEraser, Tool::PartEraser, Tool::Select})
         Add(Button::ChooseTool, static_cast<int>(tool), "", 42);
     mEnd += kSpace;
-    for (int i = 0; i < static_cast<int>(std::size(kColors)); ++i) Add(Button::ChooseColor, i, "", 34);
+    for (int i = 0; i < static_cast<int>(std::size(kColors)); ++i) Add(Button::ChooseColor, i, "", 32);
     mEnd += kSpace;
     for (int i = 0; i < static_cast<int>(std::size(kWidths)); ++i) Add(Button::ChooseWidth, i, "", 34);
     mEnd += kSpace;
@@ -123,7 +123,7 @@ bool Toolbar::IsChosen(Button const& button, Tools const& tools) {
     case Button::ChooseTool:
         return tools.GetTool() == static_cast<Tool>(button.value);
     case Button::ChooseColor:
-        return (tools.GetColor() & 0xFFFFFFu) == kColors[index];
+        return tools.GetColor() == kColors[index];
     case Button::ChooseWidth:
         return tools.GetWidth() == kWidths[index];
     case Button::GiveCommand:

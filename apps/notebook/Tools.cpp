@@ -20,9 +20,7 @@ bool Contains(RectF const& r, PointF const& p) {
 
 } // namespace
 
-unsigned Tools::GetInk() const {
-    return mTool == Tool::Highlighter ? (mColor & 0xFFFFFFu) | 0x60000000u : mColor;
-}
+unsigned Tools::GetInk() const { return GetColor() | (mTool == Tool::Highlighter ? 0x70000000 : 0xFF000000); }
 
 void Tools::Choose(Tool tool) {
     Cancel();

@@ -21,8 +21,9 @@ public:
 
     void Choose(Tool tool);
     Tool GetTool() const { return mTool; }
-    void SetColor(unsigned rgb) { mColor = 0xFF000000 | rgb; }
-    unsigned GetColor() const { return mColor; }
+    // Of the tool that is chosen: the highlighter has a colour of its own.
+    void SetColor(unsigned rgb) { (mTool == Tool::Highlighter ? mHighlight : mColor) = rgb; }
+    unsigned GetColor() const { return mTool == Tool::Highlighter ? mHighlight : mColor; }
     void SetWidth(float width) { mWidth = width; }
     float GetWidth() const { return mWidth; }
 
@@ -59,7 +60,8 @@ private:
     Page& mPage;
     Painter& mPainter;
     Tool mTool = Tool::Pen;
-    unsigned mColor = 0xFF1B2A41;
+    unsigned mColor = 0x1B2A41; // red, green, blue
+    unsigned mHighlight = 0xF5D020;
     float mWidth = 3;
 
     bool mIsDown = false;
