@@ -27,7 +27,7 @@ constexpr int kMaxSide = BitmapFactory::kMaxSide;
 constexpr int kMaxPictureSide = 4096;
 constexpr std::size_t kMaxBitmaps = 64;
 constexpr std::int64_t kMaxPicturePixels = std::int64_t{64} << 20; // 256 MiB
-constexpr std::uintmax_t kMaxFileBytes = 16u << 20;
+constexpr std::uintmax_t kMaxFileBytes = 64u << 20;
 
 struct ScenePicture {
     Picture picture;

@@ -65,6 +65,13 @@ bool Images::HasFailed(std::string const& file) const {
     return entry && entry->hasFailed;
 }
 
+// Entries stay: requests on their way have their numbers.
+void Images::Forget() {
+    mIndex.clear();
+    mPixels.clear();
+    for (Entry& entry : mEntries) entry.bitmap = {};
+}
+
 void Images::Receive(int id, IMKBitmap* bitmap) {
     // As the page's file says it: an image is often drawn much smaller than it is.
     if (bitmap) bitmap->GetBitmapReadable()->SetTextureFilter(TextureFilterMipmapped);

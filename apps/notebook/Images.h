@@ -33,6 +33,9 @@ public:
     IMKBitmap* Get(std::string const& file);
     bool HasFailed(std::string const& file) const;
 
+    // For another page: everything is loaded anew when it is asked for.
+    void Forget();
+
     // Files that were loaded, or could not be, since the last call.
     std::vector<std::string> Poll();
     bool IsBusy() const { return mPending > 0; }

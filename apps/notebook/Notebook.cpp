@@ -27,9 +27,10 @@ Notebook::Notebook(Options const& options, SDL_Window* window, RenderThread& que
       mDocument({[this](Splice const& splice) { PageHasChanged(splice); },
                  [this] {
                      mTools.Select({});
+                     mImages.Forget();
                      mTiles.Clear();
                      mView.x = mView.y = 0;
-                     mIsDirty = true;
+                     MoveView();
                  },
                  [this](std::string const& message, bool isError) { Tell(message, isError); },
                  [this] {
@@ -134,7 +135,7 @@ void Notebook::PageHasChanged(Splice const& splice) {
             mTiles.Add(object->bounds, [&](IMKCanvas& canvas) { mPainter.Draw(canvas, *object); });
     else
         mTiles.Invalidate(splice.GetBounds());
-    mIsDirty = true;
+    MoveView();
 }
 
 void Notebook::Show() {
@@ -143,7 +144,13 @@ void Notebook::Show() {
     SDL_GetWindowSize(mWindow, &width, &height);
     mView.width = width;
     mView.height = std::max(1, height - mView.top);
+    MoveView();
     mScreen = NewCanvas(mQueue, NewScreenBitmap(mQueue, width, height));
+}
+
+// At once, not with the next frame: the pen may come before it.
+void Notebook::MoveView() {
+    mView.Clamp(mDocument.GetPage().GetHeight());
     mIsDirty = true;
 }
 
@@ -152,7 +159,6 @@ void Notebook::DrawFrame() {
     if (!mScreen) return;
     mFrames.Begin();
     Page const& page = mDocument.GetPage();
-    mView.Clamp(page.GetHeight());
     IMKCanvas& canvas = *mScreen;
     canvas.ClearAll(static_cast<int>(kDesk));
     bool const isDone = mTiles.Draw(canvas, mView, page.GetHeight(), IsZooming());

@@ -63,6 +63,7 @@ private:
     void WaitForInput(int milliseconds);
     void Work();
     bool IsZooming() const;
+    void MoveView();
     void DrawFrame();
     void DrawMessage(IMKCanvas& canvas) const;
     std::string GetStatus() const;

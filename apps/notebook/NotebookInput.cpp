@@ -49,13 +49,13 @@ void Notebook::PenCancel() {
 
 void Notebook::Pan(float dx, float dy) {
     mView.Pan(dx, dy);
-    mIsDirty = true;
+    MoveView();
 }
 
 void Notebook::Zoom(float x, float y, double factor) {
     mView.ZoomAt(x, y, factor);
     mZoomedAt = SDL_GetTicks();
-    mIsDirty = true;
+    MoveView();
 }
 
 void Notebook::Key(SDL_Keycode key, bool isControl, bool isShift) {
@@ -106,10 +106,10 @@ void Notebook::Key(SDL_Keycode key, bool isControl, bool isShift) {
         return Pan(0, -page);
     case SDLK_HOME:
         mView.y = 0;
-        return;
+        return MoveView();
     case SDLK_END:
         mView.y = mView.Scale(mDocument.GetPage().GetHeight());
-        return;
+        return MoveView();
     case SDLK_PLUS:
     case SDLK_EQUALS:
         return Do(Command::ZoomIn);
@@ -263,13 +263,11 @@ void Notebook::Insert(std::string file, PointF at) {
 
 void Notebook::Quit() {
     mTools.Cancel();
-    if (mDocument.Close() || mHasQuitFailed) {
-        mIsRunning = false;
-        return;
-    }
+    bool const isKept = mDocument.Close();
+    mStatus = isKept ? 0 : 1;
+    mIsRunning = !isKept && !mHasQuitFailed;
     mHasQuitFailed = true;
-    mStatus = 1;
-    Tell(mMessage + ". Close the window again to leave all the same", true);
+    if (mIsRunning) Tell(mMessage + ". Close the window again to leave all the same", true);
 }
 
 } // namespace Moka::Notebook

@@ -166,9 +166,21 @@ TEST_F(NotebookWindowTest, ShowsWhatItsFileDrawsAndOpensItAgain) {
     script.Drag({400, 150}, {400, 320}); // is taken back
     script.Undo();
     script.Add("move 600 420 0");
-    script.Add("drop photo.png");
+    script.Add("drop photo.png"); // 480 x 320, selected
     script.Add("idle");
+    script.Drag({700, 500}, {650, 480});  // moved
+    script.Drag({1030, 720}, {790, 560}); // scaled to half
     script.Key('p');
+    // A second finger takes back what the first one began, pans and zooms.
+    script.Add("finger-down 1 0.4 0.4 0.5");
+    script.Add("finger 1 0.5 0.5 0.5");
+    script.Add("finger-down 2 0.6 0.6 0.5");
+    script.Add("finger 2 0.8 0.9 0.5");
+    script.Add("finger-up 1 0 0 0");
+    script.Add("finger-up 2 0 0 0");
+    script.Add("idle");
+    script.Key('0');
+    script.Add("key 1073741898 0"); // Home
     auto process = Start({"page.json", "--replay", WriteScript(script)});
     Soon([&] { return std::filesystem::exists(mFolder.Path("page.json.journal")) || !mWindow.Find(1, 1); });
     Picture const top = Grab();
@@ -178,11 +190,14 @@ TEST_F(NotebookWindowTest, ShowsWhatItsFileDrawsAndOpensItAgain) {
     Picture const drawn = Draw("page.json");
     ASSERT_EQ(drawn.height, 1600);
     ExpectSame(drawn.Crop(0, 0, kPage, kView), GetPagePart(Grab()), "page", kImageSlack);
-    // The word is blue-black, the highlighter yellow, the image has many colours, and the eraser left a gap.
+    // The stroke and the highlighter, the gap of the eraser, what undo brought back, and the image in its place.
     EXPECT_NE(drawn.GetColor(240 - kEdge, 250 - kToolbar), (Color{255, 255, 255, 255}));
     EXPECT_EQ(drawn.GetColor(325 - kEdge, 250 - kToolbar), (Color{255, 255, 255, 255}));
     EXPECT_NE(drawn.GetColor(400 - kEdge, 250 - kToolbar), (Color{255, 255, 255, 255}));
-    EXPECT_NE(drawn.GetColor(700, 500), (Color{255, 255, 255, 255}));
+    for (int const side : {1, 239})
+        EXPECT_NE(drawn.GetColor(526 + side, 348 + 80), (Color{255, 255, 255, 255}));
+    for (int const side : {-1, 241})
+        EXPECT_EQ(drawn.GetColor(526 + side, 348 + 80), (Color{255, 255, 255, 255}));
 
     Do("mousemove --window %1 600 400 click 5 click 5 click 5");
     Picture const scrolled = Grab();

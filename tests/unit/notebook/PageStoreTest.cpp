@@ -3,10 +3,13 @@
 #include "tests/support/TestFiles.h"
 #include "tests/unit/notebook/NotebookObjects.h"
 
+#include <csignal>
 #include <cstdlib>
 #include <filesystem>
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
+#include <sys/wait.h>
+#include <unistd.h>
 
 namespace Moka::Testing {
 namespace {
@@ -165,6 +168,48 @@ TEST_F(NotebookStoreTest, AFailedSaveSaysSoAndLosesNothing) {
     std::filesystem::create_directories(mPath + "/x");
     document->Save(nullptr);
     EXPECT_FALSE(document->Close());
+}
+
+// Writes strokes without a pause and tells, through the pipe, how many an autosave or a save has put on the disk.
+[[noreturn]] void WriteUntilKilled(Document& document, int pipe) {
+    for (int count = 0;; ++count) {
+        document.GetPage().Append(MakeDash(1, static_cast<float>(count)));
+        if (count % 5 != 0) continue;
+        if (count % 35 == 0)
+            document.Save(nullptr);
+        else
+            document.Tick(0), document.Tick(0);
+        while (document.IsBusy()) usleep(100);
+        int const kept = count + 1;
+        if (write(pipe, &kept, sizeof(kept)) < 0) _exit(1);
+    }
+}
+
+TEST_F(NotebookStoreTest, TwentyKillsAfter100MillisecondsLoseNothingThatWasWritten) {
+    int most = 0;
+    for (int kill = 0; kill < 20; ++kill) {
+        for (char const* const file : {"p.json", "p.json.journal"})
+            std::filesystem::remove(mFolder.Path(file));
+        int ends[2];
+        ASSERT_EQ(pipe(ends), 0);
+        pid_t const child = fork();
+        if (child == 0) WriteUntilKilled(*Open(mPath), ends[1]);
+        close(ends[1]);
+        usleep(100'000);
+        ::kill(child, SIGKILL);
+        waitpid(child, nullptr, 0);
+        int kept = 0;
+        while (read(ends[0], &kept, sizeof(kept)) == sizeof(kept)) {
+        }
+        close(ends[0]);
+        Objects const found = OpenCopy();
+        EXPECT_EQ(mTold, "");
+        ASSERT_GE(found.size(), static_cast<std::size_t>(kept));
+        for (std::size_t i = 0; i < found.size(); ++i)
+            ASSERT_TRUE(AreSame({found[i]}, {MakeDash(1, static_cast<float>(i))})) << i;
+        most = std::max(most, kept);
+    }
+    EXPECT_GT(most, 0) << "no child came as far as its first autosave";
 }
 
 } // namespace
