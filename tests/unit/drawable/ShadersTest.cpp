@@ -1,5 +1,5 @@
 // A class with a uniform of each kind: in which order they are bound, and what reaches the renderer. That the
-// twelve classes fit their programs is tested with a driver.
+// thirteen classes fit their programs is tested with a driver.
 #include "moka/graphics/drawable/ShaderExceptions.h"
 #include "tests/unit/drawable/ShaderFixture.h"
 
