@@ -2,10 +2,7 @@
 #include "moka/graphics/loader/MKBitmapSaveManager.h"
 
 #include "moka/base/MessageLoop.h"
-#include "tests/support/Queues.h"
 #include "tests/unit/loader/LoaderFixture.h"
-
-#include <stdexcept>
 
 namespace Moka::Testing {
 namespace {
@@ -33,7 +30,6 @@ protected:
         results.push_back(what + std::filesystem::path(path.ToUtf8()).filename().string());
         lastUserData = userData;
         lastThread = std::this_thread::get_id();
-        if (whenNoted) whenNoted();
     }
     Callback MakeCallback(void* userData = nullptr) { return {Succeeded, Failed, this, userData}; }
     bool Request(MKBitmapSaveManager& manager, std::string const& name, Callback* callback) {
@@ -50,7 +46,6 @@ protected:
     Events results;
     void* lastUserData = nullptr;
     std::thread::id lastThread;
-    std::function<void()> whenNoted;
     MessageLoop messages;
 };
 
@@ -101,23 +96,6 @@ TEST_F(SaveManager, WaitingHandsResultsOverOnTheWaitingThread) {
     EXPECT_TRUE(log.Has("SaveManager::WaitForSaveCompleting mSaveCount(0) End"));
     messages.RunPending(); // what was sent finds nothing left
     EXPECT_EQ(results.size(), 2u);
-}
-
-TEST_F(SaveManager, ACallbackMayRequestAnotherSaveAndThrow) {
-    MKBitmapSaveManager manager;
-    Callback callback = MakeCallback();
-    int left = 2;
-    whenNoted = [&] {
-        if (left-- > 0) {
-            EXPECT_TRUE(Request(manager, "again" + std::to_string(left) + ".png", &callback));
-        }
-        throw std::runtime_error("no");
-    };
-    Request(manager, "a.png", &callback);
-    Request(manager, "b.png", &callback);
-    manager.WaitForSaveCompleting(queue.get());
-    EXPECT_EQ(results, (Events{"saved a.png", "saved b.png", "saved again1.png", "saved again0.png"}));
-    EXPECT_EQ(log.Count(ANDROID_LOG_ERROR, "threw: no"), 4);
 }
 
 TEST_F(SaveManager, DestroyedWithSavesAndResultsItLeavesTheFilesAndCallsNobody) {
