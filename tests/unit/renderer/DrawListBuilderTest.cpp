@@ -145,10 +145,6 @@ TEST_F(DrawListBuilderTest, EqualValuesAreOneRecord) {
     RunState b;
     b.scissor.on = true;
     Draw(a, MakeBox('0'));
-    SetColor(1);
-    SetColor(0);
-    float const none[4] = {};
-    program->Set(color, none); // back to what it was
     Draw(a, MakeBox('1'));
     Draw(b, MakeBox('2'), 3);
     Draw(a, MakeBox('3'), 2);
