@@ -98,6 +98,16 @@ TEST_F(SaveManager, WaitingHandsResultsOverOnTheWaitingThread) {
     EXPECT_EQ(results.size(), 2u);
 }
 
+TEST_F(SaveManager, ARefusedRequestStaysCounted) {
+    MKBitmapSaveManager manager;
+    Callback callback = MakeCallback();
+    auto const empty = RefPtr<IMKBitmap>::Adopt(
+        MKGraphicsFactory::CreateBitmap(queue.get(), reinterpret_cast<TextureObject const*>(this), 1));
+    EXPECT_FALSE(manager.RequestSave(1, Path("a.png"), *empty, &callback, 100));
+    EXPECT_EQ(manager.GetRequestSaveCount(), 1);
+    EXPECT_EQ(results, Events{});
+}
+
 TEST_F(SaveManager, DestroyedWithSavesAndResultsItLeavesTheFilesAndCallsNobody) {
     CodecGate gate;
     {

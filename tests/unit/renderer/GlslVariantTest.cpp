@@ -77,20 +77,6 @@ TEST(GlslVariantTest, TextThatIsNotUnderstoodIsRefusedWithItsReason) {
     EXPECT_EQ(FindReason("#version 300 es\nvoid main() {}", modern), "");
 }
 
-TEST(GlslVariantTest, StagesMayShareAsManyVectorsAsEveryDeviceHas) {
-    for (int const own : {10, 11}) {
-        ProgramLayout layout;
-        layout.Add("matrix", BindingTypeMatrix4);
-        layout.Add("color", BindingTypeVector4);
-        std::string const last = own == 10 ? "at9" : "at9, at10";
-        std::string const vertex =
-            "varying mat2 m; varying vec4 at2, at3, at4, at5, at6, at7, at8, " + last + ";\n" + kVertex;
-        std::string const found =
-            FindReason(vertex, std::string("uniform mat4 matrix;\n") + kFragment, layout);
-        EXPECT_EQ(found, own == 10 ? "" : "it would need 16 varyings");
-    }
-}
-
 TEST(GlslVariantTest, UniformsTooLargeForABlockAreRefused) {
     for (int const count : {256, 257}) {
         ProgramLayout layout;
