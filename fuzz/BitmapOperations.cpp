@@ -149,7 +149,7 @@ void SetSampling(CanvasWorld& world) {
         IMKBitmapReadable* const readable = bitmap.GetBitmapReadable();
         if (!readable) return;
         if (filters)
-            readable->SetTextureFilter(static_cast<TextureParamFilteringValue>(value & 1));
+            readable->SetTextureFilter(static_cast<TextureParamFilteringValue>(value));
         else
             readable->SetTextureWrap(static_cast<TextureParamWrappingValue>(value));
     });

@@ -162,6 +162,7 @@ private:
     void UseTextures(DepthStencilClear const& clear) { UseTexture(clear.target.texture); }
     void UseTextures(TextureClear const& clear) { UseTexture(clear.target.texture); }
     void UseTextures(Discard const& discard) { UseTexture(discard.target.texture); }
+    void UseTextures(MipmapUpdate const& update) { UseTexture(update.texture); }
     template <class Copy>
     void UseTextures(Copy const& copy) {
         UseTexture(copy.from.texture);

@@ -79,6 +79,7 @@ void RenderTarget::ClearColor(float r, float g, float b, float a) {
     Observe(kTargetKind, this, "ClearColor", r, g, b, a);
     RequestScope const scope(*mRecorder);
     if (!scope) return;
+    mRecorder->mipmaps.Forget(mRef.texture);
     std::array<float, 4> const color{r, g, b, a};
     RequestedState& requested = *mRecorder->requested;
     if (theObserver) theObserver->OnClear({requested, this, true, color, false, 0, false, 0});

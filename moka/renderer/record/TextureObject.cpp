@@ -21,7 +21,7 @@ bool IsWrap(int value) {
            value == TextureWrapMirroredRepeat;
 }
 
-bool IsFilter(int value) { return value == TextureFilterNearest || value == TextureFilterLinear; }
+bool IsFilter(int value) { return value >= TextureFilterNearest && value <= TextureFilterMipmapped; }
 
 // False for a parameter or a value that does not exist.
 bool StoreParameter(Sampling& sampling, int id, int value) {
@@ -37,7 +37,11 @@ bool StoreParameter(Sampling& sampling, int id, int value) {
     case TextureParamFilteringMag: {
         if (!IsFilter(value)) return false;
         auto const filter = static_cast<TextureParamFilteringValue>(value);
-        (id == TextureParamFilteringMin ? sampling.minFilter : sampling.magFilter) = filter;
+        if (id == TextureParamFilteringMin) {
+            sampling.minFilter = filter;
+        } else { // levels are for shrinking alone
+            sampling.magFilter = filter == TextureFilterMipmapped ? TextureFilterLinear : filter;
+        }
         return true;
     }
     default:
@@ -80,6 +84,8 @@ void TextureObject::Bind(int unit) {
     }
     recorder.requested->SetTexture(unit, mStorage, mSampling);
     TextureRef const texture{mStorage->GetName(), mSampling, unit};
+    // External GL may sample it before the next draw of ours.
+    if (recorder.FlushesAtOnce() && recorder.UpdateMipmaps(texture)) recorder.Flush();
     recorder.CommitAtOnce([&](StateCommit& commit) {
         commit.textures = &texture;
         commit.textureCount = 1;
@@ -115,6 +121,7 @@ void TextureObject::Upload(Rect const& rect, void const* pixels, int stride) {
     TraceScope const trace("renderer", "Upload", "bytes", block.GetBytes());
     recorder.FlushIfUsed(mStorage->GetName());
     recorder.GetDevice().Upload(mStorage->GetName(), block, pixels, stride > 0 ? stride : tight);
+    recorder.mipmaps.Forget(mStorage->GetName());
     recorder.counters.bytesUploaded += block.GetBytes();
 }
 
@@ -125,7 +132,9 @@ void TextureObject::DrawToCurrent() {
     if (!scope || IsActiveTarget()) return;
     DeviceName const frameBuffer = mStorage->TakeFrameBuffer();
     if (frameBuffer == 0) return;
-    recorder.Add(TextureDraw{mStorage->Describe(frameBuffer), recorder.GetCurrentTarget()});
+    TargetRef const to = recorder.GetCurrentTarget();
+    recorder.mipmaps.Forget(to.texture);
+    recorder.Add(TextureDraw{mStorage->Describe(frameBuffer), to});
     mStorage->ReturnFrameBuffer(frameBuffer);
 }
 
@@ -138,7 +147,7 @@ void TextureObject::Store(int id, int value) {
     if (StoreParameter(mSampling, id, value)) return;
     __android_log_print(ANDROID_LOG_ERROR, "mok_log",
                         "texture parameter %d = %d is refused (\"%s\"); wrapping is 0 and 1 with value 0, "
-                        "1 or 3, filtering 4 and 5 with value 0 or 1",
+                        "1 or 3, filtering 4 and 5 with value 0, 1 or 2",
                         id, value, GetLabel());
 }
 
@@ -152,6 +161,7 @@ void TextureObject::CopyFromRenderTarget() {
     DeviceName const own = from.texture == 0 ? mStorage->TakeFrameBuffer() : 0;
     int const width = from.width > 0 ? std::min(from.width, GetWidth()) : GetWidth();
     int const height = from.height > 0 ? std::min(from.height, GetHeight()) : GetHeight();
+    recorder.mipmaps.Forget(mStorage->GetName());
     recorder.Add(TargetCopy{from, mStorage->Describe(own), width, height});
     if (own != 0) mStorage->ReturnFrameBuffer(own);
 }

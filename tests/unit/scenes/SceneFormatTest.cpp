@@ -257,7 +257,8 @@ TEST(SceneFormat, AMistakeInTheFileIsNamedWithItsPlace) {
         {"{\"size\": [8,\n0]}", "2:1: size[1] must be a whole number from 1 to 65535, not 0"},
         {"{\"size\": [16384, 16385]}", "1:10: size: more than 1 GiB of pixels"},
         {"{\"size\": [8, 6], \"operations\": [],\n\"backgroud\": 1}",
-         "2:14: backgroud is unknown; there are size, about, background, bitmaps, paints, operations"},
+         "2:14: backgroud is unknown; there are size, about, background, labels, bitmaps, paints, "
+         "operations"},
         // A column counts characters, and what is in a text is no structure.
         {"{\"about\": \"\u00e9\\\\\\\"{[,\", \"size\": true}", "1:31: size must be"},
         {"{\"size\": [8, 6],\n\"bitmaps\": {\n\"a\": {\"picture\": \"cat\", \"width\": 1, \"height\": 1}}}",
