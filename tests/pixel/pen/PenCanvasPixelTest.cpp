@@ -34,8 +34,8 @@ void FillImage(Picture& image, Rect const& r, Color const& color) {
 
 // Everything that a draw depends on, so that nothing could be drawn with it, or the wrong thing.
 void LeaveAMess(GLuint texture, GLuint sampler) {
-    for (GLenum const test : {GL_BLEND, GL_SCISSOR_TEST, GL_STENCIL_TEST, GL_DEPTH_TEST, GL_CULL_FACE})
-        glEnable(test);
+    for (int const test : {GL_BLEND, GL_SCISSOR_TEST, GL_STENCIL_TEST, GL_DEPTH_TEST, GL_CULL_FACE})
+        glEnable(static_cast<GLenum>(test));
     glBlendEquation(GL_FUNC_REVERSE_SUBTRACT);
     glBlendFunc(GL_ZERO, GL_ZERO);
     glColorMask(GL_FALSE, GL_TRUE, GL_FALSE, GL_FALSE);
