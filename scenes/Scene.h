@@ -3,6 +3,7 @@
 // Units: pixels; colours 0 ... 1. The background is cleared to as it is, so its colour is premultiplied.
 #pragma once
 
+#include "moka/base/Point.h"
 #include "moka/graphics/math/Vector.h"
 #include "scenes/SceneStage.h"
 
@@ -19,6 +20,7 @@ class IMKCanvas;
 namespace Moka::Scenes {
 
 enum class SceneGroup {
+    Note,
     Rectangles,
     TransferModes,
     Clips,
@@ -34,18 +36,26 @@ enum class SceneGroup {
 
 char const* GetTitle(SceneGroup group);
 
+// A name for a part of a picture, for whoever shows it; it is not drawn.
+struct SceneLabel {
+    PointF at; // its top left corner
+    std::string text;
+};
+
 struct Scene {
     std::string name;  // [a-z0-9-], unique
     std::string about; // one sentence
     int width = 0;
     int height = 0;
-    Vector4<float> background; // nothing, unless said
+    Vector4<float> background; // transparent by default
+    std::vector<SceneLabel> labels;
+    std::string text; // its JSON; empty for a scene that is code
 
     SceneGroup group = SceneGroup::Rectangles;
     bool alsoInStrips = false; // worth seeing on a target of three strips as well
     bool onScreen = false;     // meant for a screen bitmap; draws on any target
-    bool needsGpu = false;     // makes objects of the GPU: only on a stage with a queue
-    bool needsPen = false;     // draws ink by foreign GL code: only on a stage with a pen
+    bool needsGpu = false; // makes objects of the GPU, or shows what drivers do: only on a stage with a queue
+    bool needsPen = false; // draws ink by foreign GL code: only on a stage with a pen
 
     // On a new canvas, over what its target holds. May leave a matrix, clips and saves.
     std::function<void(IMKCanvas&, SceneStage&)> draw;

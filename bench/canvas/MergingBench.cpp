@@ -1,6 +1,7 @@
 // Frames whose draws differ in what the renderer merges over: values, programs in turn, clips.
 #include "bench/canvas/BareComparison.h"
 #include "bench/canvas/BareShapes.h"
+#include "moka/base/log/AndroidLog.h"
 #include "moka/base/log/LogSink.h"
 
 #include <benchmark/benchmark.h>
@@ -31,9 +32,9 @@ enum class ClipLog { Dropped, Written };
 class ClipLogging {
 public:
     explicit ClipLogging(ClipLog log) {
-        if (log == ClipLog::Dropped) SetLogSink([](LogLine const&) {});
+        if (log == ClipLog::Dropped) SetLogPriority(ANDROID_LOG_ERROR);
     }
-    ~ClipLogging() { SetLogSink({}); }
+    ~ClipLogging() { SetLogPriority(ANDROID_LOG_INFO); }
 };
 
 void ClippedRects(benchmark::State& state, int clips, bool each, ClipLog log) {
@@ -77,6 +78,22 @@ void Buttons(benchmark::State& state) {
             target.canvas->DrawBitmap(icon.Get(), x + 4, y + 10, &line);
             target.canvas->DrawLine(x + 20, y + 12, x + 38, y + 12, &line);
             target.canvas->DrawLine(x + 20, y + 20, x + 34, y + 20, &line);
+        }
+    });
+}
+
+// Two programs in turn, in rows of 64. With a step below their size each touches its neighbours.
+void RoundRects(benchmark::State& state, int size, int step) {
+    constexpr int kRoundRects = 4000;
+    BenchCanvas target;
+    MKPaint paint;
+    Measure(state, kRoundRects, [&] {
+        for (int i = 0; i < kRoundRects; ++i) {
+            float const x = static_cast<float>(i % 64 * step);
+            float const y = static_cast<float>(i / 64 * step);
+            float const side = static_cast<float>(size);
+            SetColor(paint, ColorOf(i, Colors::Distinct));
+            target.canvas->DrawRoundRect({x, y, x + side, y + side}, side / 4, side / 4, &paint);
         }
     });
 }
@@ -179,6 +196,8 @@ BENCHMARK_CAPTURE(ClippedRects, three_rotated, 3, false, ClipLog::Dropped)->Appl
 BENCHMARK_CAPTURE(ClippedRects, ten_rotated, 10, false, ClipLog::Dropped)->Apply(Configure);
 BENCHMARK_CAPTURE(ClippedRects, one_of_its_own_each, 1, true, ClipLog::Dropped)->Apply(Configure);
 BENCHMARK(Buttons)->Apply(Configure);
+BENCHMARK_CAPTURE(RoundRects, apart, 14, 16)->Apply(Configure);
+BENCHMARK_CAPTURE(RoundRects, overlapping, 14, 8)->Apply(Configure);
 BENCHMARK(OverlappingCircles)->Apply(Configure);
 BENCHMARK(PageOfStrokes)->Apply(Configure);
 BENCHMARK(ManyRects)->RangeMultiplier(10)->Range(1000, 1'000'000)->Apply(Configure);

@@ -65,7 +65,7 @@ TEST_P(SamplingTest, StorageIsSharedAndSamplingStateIsNot) {
     constexpr int kRefused[][2] = {{TextureParamWrappingS, 2},
                                    {TextureParamWrappingT, 4},
                                    {TextureParamWrappingS, -1},
-                                   {TextureParamFilteringMin, 2},
+                                   {TextureParamFilteringMin, -1},
                                    {TextureParamFilteringMag, 3},
                                    {2, 0},
                                    {-1, 0},

@@ -1,11 +1,12 @@
-#include "apps/samples/Note.h"
+#include "scenes/NoteScene.h"
 
-#include "apps/samples/Hand.h"
 #include "moka/graphics/factory/BitmapsAndCanvases.h"
+#include "scenes/Hand.h"
 #include "scenes/SceneError.h"
-#include "scenes/SceneFile.h"
 
-namespace Moka::Samples {
+#include <utility>
+
+namespace Moka::Scenes {
 namespace {
 
 constexpr float kTextLeft = 176;
@@ -76,18 +77,17 @@ void SketchPot(Hand& hand, float x, float y) {
 
 } // namespace
 
-Scenes::Scene MakeNote(std::string const& page) {
-    Scenes::Scene scene = Scenes::LoadScene(page);
-    scene.needsGpu = scene.needsPen = true;
-    scene.draw = [drawPage = scene.draw](IMKCanvas& canvas, Scenes::SceneStage& stage) {
-        drawPage(canvas, stage);
+void AddHandwriting(Scene& paper) {
+    paper.needsGpu = paper.needsPen = true;
+    paper.draw = [drawPaper = std::move(paper.draw)](IMKCanvas& canvas, SceneStage& stage) {
+        if (!stage.GetQueue() || !stage.GetPen()) throw SceneError("note needs a GPU and a pen");
+        drawPaper(canvas, stage);
         auto const pen = NewPenCanvas(*stage.GetQueue(), canvas.GetBitmap());
-        if (!pen || !stage.GetPen()) throw Scenes::SceneError("there is no pen canvas");
+        if (!pen) throw SceneError("there is no room for a pen canvas");
         Hand hand(*stage.GetPen(), *pen);
         WriteText(hand);
         SketchPot(hand, 1010, -48);
     };
-    return scene;
 }
 
-} // namespace Moka::Samples
+} // namespace Moka::Scenes

@@ -7,9 +7,9 @@
 #include <string>
 #include <vector>
 
-namespace Moka::Samples {
+namespace Moka::Scenes {
 
-using Path = std::vector<Scenes::InkPoint>; // through which a stroke goes; the radius is the stroke's
+using Path = std::vector<InkPoint>; // through which a stroke goes; the radius is the stroke's
 
 struct Ink {
     Vector4<float> color; // premultiplied
@@ -20,7 +20,7 @@ struct Ink {
 
 class Hand {
 public:
-    Hand(Scenes::ScenePen& pen, IMKPenCanvas& canvas) : mPen(pen), mCanvas(canvas) {}
+    Hand(ScenePen& pen, IMKPenCanvas& canvas) : mPen(pen), mCanvas(canvas) {}
 
     // Small letters, digits, spaces, commas and full stops.
     void Write(std::string const& text, float x, float y, Ink const& ink);
@@ -30,9 +30,9 @@ public:
 private:
     void Trace(Path const& path, Ink const& ink);
 
-    Scenes::ScenePen& mPen;
+    ScenePen& mPen;
     IMKPenCanvas& mCanvas;
     unsigned mSeed = 1; // of the unevenness
 };
 
-} // namespace Moka::Samples
+} // namespace Moka::Scenes

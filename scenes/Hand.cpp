@@ -1,14 +1,12 @@
-#include "apps/samples/Hand.h"
+#include "scenes/Hand.h"
 
 #include <algorithm>
 #include <cmath>
 #include <iterator>
 #include <sstream>
 
-namespace Moka::Samples {
+namespace Moka::Scenes {
 namespace {
-
-using Scenes::InkPoint;
 
 constexpr float kStep = 1.5f; // pixels between the points of a smooth line
 constexpr float kTip = 4;     // points over which a long stroke begins and ends
@@ -167,4 +165,4 @@ void Hand::Sketch(char const* points, float x, float y, Ink const& ink) {
     Trace(path, ink);
 }
 
-} // namespace Moka::Samples
+} // namespace Moka::Scenes
