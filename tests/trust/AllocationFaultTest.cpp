@@ -1,9 +1,6 @@
 // Memory runs out at every place where it can, once and for good, in every scenario.
-#include "moka/base/RefPtr.h"
 #include "moka/base/String.h"
-#include "moka/graphics/bitmap/IMKBitmap.h"
 #include "moka/graphics/bitmap/ImageDecoding.h"
-#include "moka/graphics/canvas/IMKCanvas.h"
 #include "moka/graphics/drawable/ShaderManager.h"
 #include "moka/graphics/drawable/Shaders.h"
 #include "moka/graphics/factory/MKGraphicsFactory.h"
@@ -227,34 +224,6 @@ TEST(FileWithoutAQueue, LosesItsDecodedPixels) {
     auto const objects = Faults::CountLive(Faults::Kind::Objects);
     EXPECT_EQ(MKGraphicsFactory::CreateBitmap(nullptr, &path, 1), nullptr);
     EXPECT_EQ(Faults::CountLive(Faults::Kind::Objects), objects + 1);
-}
-
-// The containers of a canvas: what they have no memory for did not happen, and nobody sees an exception.
-TEST(ThrowingAllocationFaults, ALevelOrAClipThatDoesNotFitIsDropped) {
-    RendererTrace::Reset();
-    ASSERT_TRUE(RendererFactory::AttachContext());
-    HandPumpedQueue queue;
-    {
-        auto const target =
-            RefPtr<IMKBitmap>::Adopt(MKGraphicsFactory::CreateBitmap(&queue, 8, 8, nullptr, false, 0, false));
-        auto const canvas =
-            RefPtr<IMKCanvas>::Adopt(MKGraphicsFactory::CreateCanvas(&queue, target.Get(), 0));
-        canvas->PreScale(2, 2);
-        Faults::Arm(Faults::Kind::Throwing, 1, true);
-        int const level = canvas->Save(IMKCanvas::SaveAll);
-        canvas->SetClipRect(0, 0, 1, 1, IMKCanvas::Intersect);
-        int const refused = Faults::Disarm();
-        EXPECT_EQ(refused, 2);
-        EXPECT_EQ(level, 0);
-        canvas->PreScale(3, 3);
-        Matrix3<float> const scaled = canvas->GetMatrix();
-        canvas->Restore(level);
-        EXPECT_TRUE(canvas->GetMatrix() == scaled);
-        canvas->Clear(1, 1, 1, 1);
-        EXPECT_FALSE(RendererTrace::GetClears().back().state.scissorOn);
-    }
-    EXPECT_EQ(RendererTrace::CountLiveObjects(), 0);
-    RendererFactory::DetachContext();
 }
 
 INSTANTIATE_TEST_SUITE_P(Of, AllocationFaults, ::testing::ValuesIn(GetScenarios()), NameOfScenario);
