@@ -90,12 +90,13 @@ SceneOperation ReadGroup(SceneFields& fields, SceneNames const& names) {
     group->content = ReadSteps(fields.Get("operations"), names);
     return {[group](IMKCanvas& canvas, SceneBitmaps const& bitmaps) { group->Play(canvas, bitmaps); },
             // What is empty takes time, too, when it is repeated.
-            std::max(1LL, group->content.count) * group->repeat};
+            std::max(1LL, group->content.count) * group->repeat, group->content.needsGpu};
 }
 
 SceneOperationReader FindReader(std::string const& name) {
     if (name == "Group") return ReadGroup;
-    for (SceneOperationTable const* const table : {&GetDrawingOperations(), &GetStateOperations()}) {
+    for (SceneOperationTable const* const table :
+         {&GetDrawingOperations(), &GetDrawableOperations(), &GetStateOperations()}) {
         auto const found = table->find(name);
         if (found != table->end()) return found->second;
     }
@@ -104,7 +105,8 @@ SceneOperationReader FindReader(std::string const& name) {
 
 std::string ListOperations() {
     std::string names = "Group";
-    for (SceneOperationTable const* const table : {&GetDrawingOperations(), &GetStateOperations()})
+    for (SceneOperationTable const* const table :
+         {&GetDrawingOperations(), &GetDrawableOperations(), &GetStateOperations()})
         for (auto const& entry : *table) names += ", " + entry.first;
     return names;
 }
@@ -131,6 +133,7 @@ SceneSteps ReadSteps(SceneValue const& value, SceneNames const& names) {
         SceneOperation operation = ReadOperation(item, names);
         result.count += std::max(1LL, operation.count);
         CheckCount(result.count, item);
+        result.needsGpu = result.needsGpu || operation.needsGpu;
         result.steps.push_back(std::move(operation.step));
     }
     return result;

@@ -22,6 +22,7 @@ using SceneStep = std::function<void(IMKCanvas&, SceneBitmaps const&)>;
 struct SceneSteps {
     std::vector<SceneStep> steps;
     long long count = 0; // operations when played once
+    bool needsGpu = false;
 
     void Play(IMKCanvas& canvas, SceneBitmaps const& bitmaps) const {
         for (SceneStep const& step : steps) step(canvas, bitmaps);
@@ -38,14 +39,21 @@ struct SceneNames {
 struct SceneOperation {
     SceneStep step;
     long long count = 1;
+    bool needsGpu = false;
 };
 
 using SceneOperationReader = SceneOperation (*)(SceneFields&, SceneNames const&);
 using SceneOperationTable = std::map<std::string, SceneOperationReader>;
 
-// By the names that the canvas gives them: what draws; what clears, clips, saves or sets the matrix.
+// By the names that the canvas gives them: what draws; what clears, clips, saves or sets the matrix. By names of
+// their own: custom drawables of the library, and what a recording could not say.
 SceneOperationTable const& GetDrawingOperations();
+SceneOperationTable const& GetDrawableOperations();
 SceneOperationTable const& GetStateOperations();
+
+// Of the field "paint", a new one without it; of the field key, which names a bitmap.
+MKPaint GetPaint(SceneFields& fields, SceneNames const& names);
+std::size_t GetBitmap(SceneFields& fields, SceneNames const& names, char const* key = "bitmap");
 
 // value is a list of operations, groups among them.
 SceneSteps ReadSteps(SceneValue const& value, SceneNames const& names);
