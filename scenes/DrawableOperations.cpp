@@ -30,7 +30,7 @@ SceneOperation ReadBlendedBitmap(SceneFields& fields, SceneNames const& names) {
                      by = size ? ReadPoint(*size) : PointF()](SceneBitmaps const& bitmaps) {
                         // Takes these references over.
                         return new (std::nothrow) MKBlendedBitmapDrawable(
-                            bitmaps[first]->GetMsgQueue(), RefPtr<IMKBitmap>(bitmaps[first]).Release(),
+                            bitmaps.queue, RefPtr<IMKBitmap>(bitmaps[first]).Release(),
                             RefPtr<IMKBitmap>(bitmaps[second]).Release(), src, dst, by.x, by.y);
                     });
 }
@@ -44,7 +44,7 @@ SceneOperation ReadGaussianBlur(SceneFields& fields, SceneNames const& names) {
         GetPaint(fields, names),
         [=, isHorizontal = !horizontal || ReadBool(*horizontal), by = amount ? ReadFloat(*amount) : 1.0f,
          shift = offset ? ReadPoint(*offset) : PointF()](SceneBitmaps const& bitmaps) {
-            auto* const blur = new (std::nothrow) MKGaussianBlurDrawable(bitmaps[bitmap]->GetMsgQueue());
+            auto* const blur = new (std::nothrow) MKGaussianBlurDrawable(bitmaps.queue);
             if (!blur) return blur;
             blur->SetBitmap(bitmaps[bitmap].Get());
             blur->SetHorizotalDirection(isHorizontal);
@@ -59,7 +59,7 @@ SceneOperation ReadNonPremultipliedColor(SceneFields& fields, SceneNames const& 
     std::size_t const dst = GetBitmap(fields, names, "dst");
     return DrawMade(GetPaint(fields, names), [=](SceneBitmaps const& bitmaps) {
         auto* const drawable =
-            new (std::nothrow) MKNonPremultipliedColorDrawable(bitmaps[src]->GetMsgQueue());
+            new (std::nothrow) MKNonPremultipliedColorDrawable(bitmaps.queue);
         if (drawable) drawable->SetBitmap(bitmaps[src].Get(), bitmaps[dst].Get());
         return drawable;
     });
@@ -69,7 +69,7 @@ SceneOperation ReadTextMask(SceneFields& fields, SceneNames const& names) {
     std::size_t const bitmap = GetBitmap(fields, names);
     return DrawMade(GetPaint(fields, names), [=, x = fields.GetFloat("x"),
                                               y = fields.GetFloat("y")](SceneBitmaps const& bitmaps) {
-        auto* const mask = new (std::nothrow) MKTextMaskBitmapDrawable(bitmaps[bitmap]->GetMsgQueue());
+        auto* const mask = new (std::nothrow) MKTextMaskBitmapDrawable(bitmaps.queue);
         if (!mask) return mask;
         mask->SetBitmap(bitmaps[bitmap].Get());
         mask->SetDstPosition(x, y);

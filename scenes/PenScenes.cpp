@@ -85,7 +85,7 @@ std::vector<Scene> MakePenScenes() {
     scene.group = SceneGroup::PenCanvas;
     scene.name = "pen-stroke";
     scene.about =
-        "Ink drawn by foreign GL code: whole, cut by two clips, and turned under a clip that replaced "
+        "Ink drawn by external GL code: whole, cut by two clips, and rotated under a clip that replaced "
         "another.";
     scene.width = 480;
     scene.height = 140;

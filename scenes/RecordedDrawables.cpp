@@ -3,6 +3,7 @@
 #include "moka/graphics/drawable/MKBlendedBitmapDrawable.h"
 #include "moka/graphics/drawable/MKGaussianBlurDrawable.h"
 #include "moka/graphics/drawable/MKNonPremultipliedColorDrawable.h"
+#include "moka/graphics/drawable/MKStrokeDrawable.h"
 #include "moka/graphics/drawable/MKTextMaskBitmapDrawable.h"
 
 namespace Moka::Scenes {
@@ -40,6 +41,11 @@ std::optional<SceneLine> DrawableLine::Describe(IMKCustomDrawable& drawable) {
         SceneLine line("DrawTextMask");
         AddBitmap(line, "bitmap", mask->GetBitmap());
         return line.Add("x", mask->GetDstPosition().x).Add("y", mask->GetDstPosition().y);
+    }
+    if (auto* const stroke = dynamic_cast<MKStrokeDrawable*>(&drawable)) {
+        std::vector<std::array<float, 3>> points;
+        for (MKStrokePoint const& p : stroke->ReadPoints()) points.push_back({p.x, p.y, p.width});
+        return SceneLine("DrawStroke").Add("points", points);
     }
     return std::nullopt;
 }

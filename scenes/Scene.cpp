@@ -8,6 +8,8 @@ namespace Moka::Scenes {
 
 char const* GetTitle(SceneGroup group) {
     switch (group) {
+    case SceneGroup::Note:
+        return "A note page";
     case SceneGroup::Rectangles:
         return "Rectangles";
     case SceneGroup::TransferModes:

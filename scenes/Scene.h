@@ -3,6 +3,7 @@
 // Units: pixels; colours 0 ... 1. The background is cleared to as it is, so its colour is premultiplied.
 #pragma once
 
+#include "moka/base/Point.h"
 #include "moka/graphics/math/Vector.h"
 #include "scenes/SceneStage.h"
 
@@ -19,6 +20,7 @@ class IMKCanvas;
 namespace Moka::Scenes {
 
 enum class SceneGroup {
+    Note,
     Rectangles,
     TransferModes,
     Clips,
@@ -34,12 +36,20 @@ enum class SceneGroup {
 
 char const* GetTitle(SceneGroup group);
 
+// A name for a part of a picture, for whoever shows it; it is not drawn.
+struct SceneLabel {
+    PointF at; // its top left corner
+    std::string text;
+};
+
 struct Scene {
     std::string name;  // [a-z0-9-], unique
     std::string about; // one sentence
     int width = 0;
     int height = 0;
-    Vector4<float> background; // nothing, unless said
+    Vector4<float> background; // transparent by default
+    std::vector<SceneLabel> labels;
+    std::string text; // its JSON; empty for a scene that is code
 
     SceneGroup group = SceneGroup::Rectangles;
     bool alsoInStrips = false; // worth seeing on a target of three strips as well

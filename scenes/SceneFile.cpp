@@ -38,7 +38,8 @@ struct Content {
 
     void Draw(IMKCanvas& canvas, SceneStage& stage) const {
         SceneBitmaps bitmaps;
-        if (NeedsGpu() && !stage.GetQueue()) throw SceneError("the scene draws on a GPU only");
+        bitmaps.queue = stage.GetQueue();
+        if (NeedsGpu() && !bitmaps.queue) throw SceneError("the scene draws on a GPU only");
         for (ScenePicture const& one : pictures) {
             bitmaps.push_back(RefPtr<IMKBitmap>::Adopt(stage.MakeBitmap(one.picture)));
             if (!bitmaps.back()) throw SceneError("there is no room for the scene's bitmaps");
@@ -48,11 +49,11 @@ struct Content {
         steps.Play(canvas, bitmaps);
     }
 
-    // No two drivers filter alike, and custom drawables have programs.
+    // No two drivers filter mipmaps alike, and custom drawables have programs.
     bool NeedsGpu() const {
-        return std::any_of(pictures.begin(), pictures.end(),
-                           [](ScenePicture const& one) { return one.filter != TextureFilterLinear; }) ||
-               steps.needsGpu;
+        return steps.needsGpu || std::any_of(pictures.begin(), pictures.end(), [](ScenePicture const& one) {
+                   return one.filter != TextureFilterLinear;
+               });
     }
 };
 
@@ -165,12 +166,24 @@ void ReadSize(SceneFields& fields, Scene& scene) {
         throw SceneValueError(size, ": more than 1 GiB of pixels");
 }
 
+std::vector<SceneLabel> ReadLabels(SceneValue const& value) {
+    if (value.kind != Kind::List) ThrowExpected(value, "a list of labels");
+    std::vector<SceneLabel> labels;
+    for (SceneValue const& item : value.items) {
+        SceneFields fields(item);
+        labels.push_back({fields.GetPoint("at"), ReadText(fields.Get("text"))});
+        fields.CheckAll();
+    }
+    return labels;
+}
+
 Scene ReadScene(SceneValue const& root, std::string const& folder) {
     SceneFields fields(root);
     Scene scene;
     ReadSize(fields, scene);
     if (SceneValue const* const value = fields.Find("about")) scene.about = ReadText(*value);
     if (SceneValue const* const value = fields.Find("background")) scene.background = ReadColor(*value);
+    if (SceneValue const* const value = fields.Find("labels")) scene.labels = ReadLabels(*value);
     auto const content = std::make_shared<Content>();
     if (SceneValue const* const value = fields.Find("bitmaps")) ReadBitmaps(*value, folder, *content);
     if (SceneValue const* const value = fields.Find("paints")) ReadPaints(*value, content->names.paints);

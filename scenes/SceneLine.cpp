@@ -82,28 +82,31 @@ SceneLine& SceneLine::Add(char const* key, Vector4<float> const& color) {
     return *this;
 }
 
-SceneLine& SceneLine::Add(char const* key, std::vector<PointF> const& points) {
+template <class Item, class GetNumbers>
+SceneLine& SceneLine::AddList(char const* key, std::vector<Item> const& items, GetNumbers const& getNumbers) {
     Begin(key);
-    for (PointF const& p : points) {
-        mFields += &p == points.data() ? "[" : ", ";
-        float const numbers[] = {p.x, p.y};
-        Write(numbers, 2);
+    mFields += '[';
+    for (Item const& item : items) {
+        if (&item != items.data()) mFields += ", ";
+        auto const numbers = getNumbers(item);
+        Write(numbers.data(), numbers.size());
     }
-    mFields += points.empty() ? "[]" : "]";
-    mCount = std::max(mCount, static_cast<long long>(points.size()));
+    mFields += ']';
+    mCount = std::max(mCount, static_cast<long long>(items.size()));
     return *this;
 }
 
+SceneLine& SceneLine::Add(char const* key, std::vector<PointF> const& points) {
+    return AddList(key, points, [](PointF const& p) { return std::array<float, 2>{p.x, p.y}; });
+}
+
 SceneLine& SceneLine::Add(char const* key, std::vector<RectF> const& rects) {
-    Begin(key);
-    for (RectF const& r : rects) {
-        mFields += &r == rects.data() ? "[" : ", ";
-        float const numbers[] = {r.left, r.top, r.right, r.bottom};
-        Write(numbers, 4);
-    }
-    mFields += rects.empty() ? "[]" : "]";
-    mCount = std::max(mCount, static_cast<long long>(rects.size()));
-    return *this;
+    return AddList(key, rects,
+                   [](RectF const& r) { return std::array<float, 4>{r.left, r.top, r.right, r.bottom}; });
+}
+
+SceneLine& SceneLine::Add(char const* key, std::vector<std::array<float, 3>> const& items) {
+    return AddList(key, items, [](std::array<float, 3> const& item) { return item; });
 }
 
 SceneLine& SceneLine::AddRaw(char const* key, std::string const& text) {

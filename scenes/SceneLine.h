@@ -7,7 +7,9 @@
 #include "moka/graphics/math/Matrix3.h"
 #include "moka/graphics/math/Vector.h"
 
+#include <array>
 #include <string>
+#include <utility>
 #include <vector>
 
 namespace Moka::Scenes {
@@ -28,6 +30,7 @@ public:
     SceneLine& Add(char const* key, Vector4<float> const& color);
     SceneLine& Add(char const* key, std::vector<PointF> const& points);
     SceneLine& Add(char const* key, std::vector<RectF> const& rects);
+    SceneLine& Add(char const* key, std::vector<std::array<float, 3>> const& items);
     SceneLine& AddText(char const* key, std::string const& text) { return AddRaw(key, Quote(text)); }
     // text is JSON.
     SceneLine& AddRaw(char const* key, std::string const& text);
@@ -43,6 +46,8 @@ public:
     std::string GetText() const { return '{' + Quote(mOperation) + ": " + GetFields() + '}'; }
 
 private:
+    template <class Item, class GetNumbers>
+    SceneLine& AddList(char const* key, std::vector<Item> const& items, GetNumbers const& getNumbers);
     void Begin(char const* key);
     void Write(float value);
     void Write(float const* values, std::size_t count);

@@ -1,4 +1,5 @@
 #include "scenes/CustomScenes.h"
+#include "scenes/NoteScene.h"
 #include "scenes/PenScenes.h"
 #include "scenes/SceneError.h"
 #include "scenes/SceneFile.h"
@@ -18,6 +19,7 @@ struct Entry {
 
 // In the gallery's order.
 constexpr Entry kEntries[] = {
+    {"note", SceneGroup::Note},
     {"rect-styles", SceneGroup::Rectangles},
     {"rect-widths", SceneGroup::Rectangles},
     {"rect-fractions", SceneGroup::Rectangles},
@@ -48,6 +50,7 @@ constexpr Entry kEntries[] = {
     {"round-rect-styles", SceneGroup::RoundRectangles},
     {"round-rect-radii", SceneGroup::RoundRectangles},
     {"round-rect-matrices", SceneGroup::RoundRectangles},
+    {"strokes", SceneGroup::CustomDrawables},
     {"screen", SceneGroup::Screen},
 };
 
@@ -58,7 +61,9 @@ Scene ReadEntry(Entry const& entry) {
     });
     if (text == end) throw SceneError(std::string("there is no file of the scene ") + entry.name);
     Scene scene = ParseScene(text->text, std::string("scenes/data/") + entry.name + ".json", "");
+    if (entry.group == SceneGroup::Note) AddHandwriting(scene);
     scene.name = entry.name;
+    scene.text = text->text;
     scene.group = entry.group;
     scene.alsoInStrips = entry.alsoInStrips;
     scene.onScreen = entry.group == SceneGroup::Screen;

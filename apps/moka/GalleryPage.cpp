@@ -1,106 +1,91 @@
 #include "apps/moka/GalleryPage.h"
 
+#include "apps/moka/PageTemplate.h"
+#include "moka/base/Version.h"
+
+#include <array>
+#include <cstdio>
+#include <ctime>
+
 namespace Moka::Tool {
 namespace {
+
+constexpr char kPage[] =
+#include "GalleryTemplate.inc"
+    ;
 
 // Narrower pictures are shown enlarged, pixel by pixel.
 constexpr int kSmallWidth = 160;
 constexpr int kZoom = 4;
 
-constexpr char kHead[] = R"(<!DOCTYPE html>
-<html lang="en">
-<head>
-<meta charset="utf-8">
-<meta name="viewport" content="width=device-width, initial-scale=1">
-<title>libMokaGraphics: the gallery</title>
-<style>
-  body { margin: 0 auto; max-width: 1500px; padding: 1.5rem; background: #fff; color: #222;
-         font: 15px/1.45 system-ui, sans-serif; }
-  h1 { font-size: 1.6rem; margin: 0; }
-  h2 { font-size: 1.15rem; margin: 2.2rem 0 .8rem; padding-top: .8rem; border-top: 1px solid #ddd; }
-  nav a { margin-right: .9rem; white-space: nowrap; }
-  .group { display: flex; flex-wrap: wrap; gap: 1.6rem; align-items: flex-start; }
-  figure { margin: 0; }
-  /* What is transparent shows the chequers. */
-  img { display: block; max-width: 100%; height: auto; border: 1px solid #ccc;
-        background: repeating-conic-gradient(#fff 0 25%, #dfe3ea 0 50%) 0 0 / 16px 16px; }
-  img.enlarged { image-rendering: pixelated; }
-  figcaption { width: min-content; min-width: 100%; padding-top: .45rem; color: #555; }
-  figcaption b { color: #222; }
-</style>
-</head>
-<body>
-)";
-
-std::string Escape(std::string const& text) {
-    std::string escaped;
-    for (char const c : text) {
-        switch (c) {
-        case '&':
-            escaped += "&amp;";
-            break;
-        case '<':
-            escaped += "&lt;";
-            break;
-        case '>':
-            escaped += "&gt;";
-            break;
-        case '"':
-            escaped += "&quot;";
-            break;
-        default:
-            escaped += c;
-        }
-    }
-    return escaped;
+std::string Today() {
+    std::time_t const now = std::time(nullptr);
+    std::tm utc{};
+    gmtime_r(&now, &utc);
+    std::array<char, 16> text{};
+    std::strftime(text.data(), text.size(), "%Y-%m-%d", &utc);
+    return text.data();
 }
 
-std::string Anchor(Scenes::SceneGroup group) { return "group-" + std::to_string(static_cast<int>(group)); }
-
-bool BeginsGroup(std::vector<GalleryPicture> const& pictures, std::size_t i) {
-    return i == 0 || pictures[i].scene->group != pictures[i - 1].scene->group;
+std::string ToPercent(float part, int whole) {
+    std::array<char, 32> text{};
+    std::snprintf(text.data(), text.size(), "%.2f",
+                  100.0 * static_cast<double>(part) / static_cast<double>(whole));
+    return text.data();
 }
 
-std::string MakeContents(std::vector<GalleryPicture> const& pictures) {
-    std::string links;
-    for (std::size_t i = 0; i < pictures.size(); ++i) {
-        Scenes::SceneGroup const group = pictures[i].scene->group;
-        if (BeginsGroup(pictures, i))
-            links += "<a href=\"#" + Anchor(group) + "\">" + Escape(GetTitle(group)) + "</a>\n";
-    }
-    return "<nav>\n" + links + "</nav>\n";
-}
-
-std::string MakeFigure(GalleryPicture const& picture) {
+PageValues MakePicture(GalleryPicture const& picture) {
     Scenes::Scene const& scene = *picture.scene;
     bool const isSmall = scene.width < kSmallWidth;
     int const zoom = isSmall ? kZoom : 1;
-    std::string const name = Escape(picture.GetName());
-    std::string const about =
-        Escape(scene.about + (picture.isInStrips ? " On a target of three strips." : ""));
-    return "<figure id=\"" + name + "\"><img src=\"" + name + ".png\"" +
-           (isSmall ? " class=\"enlarged\"" : "") + " width=\"" + std::to_string(scene.width * zoom) +
-           "\" height=\"" + std::to_string(scene.height * zoom) + "\" alt=\"" + about +
-           "\">\n<figcaption><b>" + name + "</b> " + std::to_string(scene.width) + " x " +
-           std::to_string(scene.height) + (isSmall ? ", enlarged" : "") + "<br>" + about +
-           "<br>draws requested: " + std::to_string(picture.drawRequests) +
-           ", draw calls: " + std::to_string(picture.drawCalls) + "</figcaption></figure>\n";
+    PageValues values;
+    values.texts = {{"picture", picture.GetName()},
+                    {"width", std::to_string(scene.width)},
+                    {"height", std::to_string(scene.height)},
+                    {"shownWidth", std::to_string(scene.width * zoom)},
+                    {"shownHeight", std::to_string(scene.height * zoom)},
+                    {"kind", isSmall ? "enlarged" : ""},
+                    {"strips", picture.isInStrips ? ", on three strips" : ""},
+                    {"requests", std::to_string(picture.drawRequests)},
+                    {"calls", std::to_string(picture.drawCalls)}};
+    for (Scenes::SceneLabel const& label : scene.labels)
+        values.lists["labels"].push_back({{{"label", label.text},
+                                           {"left", ToPercent(label.at.x, scene.width)},
+                                           {"top", ToPercent(label.at.y, scene.height)}},
+                                          {}});
+    return values;
+}
+
+PageValues MakeScene(Scenes::Scene const& scene) {
+    PageValues values;
+    values.texts = {{"scene", scene.name}, {"about", scene.about}, {"text", scene.text}};
+    values.lists[scene.text.empty() ? "code" : "json"].emplace_back();
+    return values;
 }
 
 } // namespace
 
 std::string MakeGalleryPage(std::vector<GalleryPicture> const& pictures, std::string const& device) {
-    std::string page = std::string(kHead) + "<h1>libMokaGraphics: the gallery</h1>\n<p>" +
-                       std::to_string(pictures.size()) + " pictures, drawn by " + Escape(device) + ".</p>\n" +
-                       MakeContents(pictures);
-    for (std::size_t i = 0; i < pictures.size(); ++i) {
-        Scenes::SceneGroup const group = pictures[i].scene->group;
-        if (BeginsGroup(pictures, i))
-            page += std::string(i == 0 ? "" : "</div>\n") + "<h2 id=\"" + Anchor(group) + "\">" +
-                    Escape(GetTitle(group)) + "</h2>\n<div class=\"group\">\n";
-        page += MakeFigure(pictures[i]);
+    PageValues page;
+    page.texts = {{"version", MOKA_VERSION},
+                  {"device", device},
+                  {"date", Today()},
+                  {"count", std::to_string(pictures.size())}};
+    std::vector<PageValues>& groups = page.lists["groups"];
+    Scenes::Scene const* last = nullptr;
+    for (GalleryPicture const& picture : pictures) {
+        Scenes::Scene const& scene = *picture.scene;
+        if (!last || last->group != scene.group) {
+            groups.emplace_back();
+            groups.back().texts = {{"title", GetTitle(scene.group)},
+                                   {"group", "group-" + std::to_string(static_cast<int>(scene.group))}};
+        }
+        std::vector<PageValues>& scenes = groups.back().lists["scenes"];
+        if (last != &scene) scenes.push_back(MakeScene(scene));
+        scenes.back().lists["pictures"].push_back(MakePicture(picture));
+        last = &scene;
     }
-    return page + "</div>\n</body>\n</html>\n";
+    return FillPage(kPage, page);
 }
 
 } // namespace Moka::Tool

@@ -1,26 +1,16 @@
-// moka_samples: draws the demonstration's note page, and compares image files pixel by pixel.
-#include "apps/moka/PenStroke.h"
+// moka_samples: compares two image files pixel by pixel, for the demonstration.
 #include "apps/samples/Compare.h"
-#include "apps/samples/Note.h"
-#include "moka/base/Bitmap.h"
-#include "moka/base/BitmapFactory.h"
-#include "moka/base/String.h"
 #include "moka/base/System.h"
-#include "moka/host/RenderThread.h"
-#include "scenes/SceneError.h"
-#include "scenes/SceneRenderer.h"
 
 #include <cstdio>
 #include <cstring>
-#include <memory>
-#include <string>
 
 namespace {
 
-using namespace Moka;
+namespace Samples = Moka::Samples;
 
 int Usage() {
-    std::fputs("moka_samples: give --note PAGE.json OUTPUT, or --compare A B\n", stderr);
+    std::fputs("moka_samples: give --compare A B\n", stderr);
     return 2;
 }
 
@@ -38,19 +28,6 @@ int CompareFiles(char const* a, char const* b) {
     return 1;
 }
 
-int DrawNote(std::string const& page, std::string const& output) {
-    std::string error;
-    std::unique_ptr<RenderThread> const queue = RenderThread::Start({}, &error);
-    if (!queue) throw Scenes::SceneError(error);
-    Tool::PenStroke pen(*queue);
-    Scenes::Picture picture = RenderScene(Samples::MakeNote(page), *queue, &pen);
-    Bitmap image;
-    image.Construct(picture.pixels.data(), picture.width, picture.height,
-                    static_cast<int>(picture.GetStride()), Bitmap::kFormatRgba8888, false, false);
-    String const name = String::FromFileName(output);
-    return BitmapFactory::SaveBitmap(&image, &name, 100) ? 0 : 1;
-}
-
 } // namespace
 
 int main(int argc, char** argv) {
@@ -58,7 +35,6 @@ int main(int argc, char** argv) {
     Moka::System::SetBuildTypeEngMode(true); // what the log says names the files
     try {
         if (std::strcmp(argv[1], "--compare") == 0) return CompareFiles(argv[2], argv[3]);
-        if (std::strcmp(argv[1], "--note") == 0) return DrawNote(argv[2], argv[3]);
     } catch (std::exception const& error) {
         std::fprintf(stderr, "moka_samples: %s\n", error.what());
         return 1;

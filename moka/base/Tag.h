@@ -1,5 +1,5 @@
-// Tag: a label of at most 126 bytes, for logs and debuggers. The limit is one fewer than would fit: callers
-// depend on where a long tag is cut.
+// Tag: a label of at most 126 bytes, for logs and debuggers. The limit is one byte less than would fit.
+// Compat: tag-limit
 #pragma once
 
 #include <cstddef>
@@ -13,7 +13,7 @@ public:
     void Set(char const* text) {
         if (text) mText[Write(text)] = '\0';
     }
-    // The same, but a shorter text does not end an earlier, longer one.
+    // The same without a terminator: the end of an earlier, longer text stays. // Compat: tag-tail
     void Overwrite(char const* text) {
         if (text) Write(text);
     }

@@ -4,7 +4,7 @@
 // Thread:  render thread.
 // Types:   the handle converts from the type it reports: a bool is one byte, an int or a texture unit an int,
 //          a vector or a matrix its packed floats (matrices column-major).
-// Set stands first and the destructor right behind it; those places are part of the contract.
+// The vtable order is ABI: Set first, then the destructor.
 #pragma once
 
 namespace Moka {

@@ -3,7 +3,7 @@
 // Thread: render thread.
 // Units:  pixels from the target's own corner. Off-screen targets keep texture row 0 at GL row 0; a host's
 //         frame buffer is bottom-up.
-// The order of the operations is part of the contract.
+// The vtable order is ABI.
 #pragma once
 
 #include "moka/renderer/PixelBuffer.h"

@@ -1,6 +1,6 @@
 // IRendererDeviceCaps: the device's capabilities, read once when the render thread's context is made.
 // Thread: any, without GL. Before a context exists it answers with the minimum of OpenGL ES 3.0.
-// GetMaxTextureSize stands right behind the destructor; that place is part of the contract.
+// The vtable order is ABI: the destructor, then GetMaxTextureSize.
 #pragma once
 
 namespace Moka {

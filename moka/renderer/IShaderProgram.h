@@ -3,7 +3,7 @@
 // Owner:  whoever created it, until Release(). It outlives its context: made current in a later one, it is
 //         compiled there, with the values and handles that it has.
 // Thread: render thread.
-// The order of the operations is part of the contract.
+// The vtable order is ABI.
 #pragma once
 
 namespace Moka {

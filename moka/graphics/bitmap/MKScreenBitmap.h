@@ -1,7 +1,7 @@
 // MKScreenBitmap: a screen bitmap for use from any thread: each operation is posted to the render thread. See
 // MKScreenBitmapBase for what it can do.
-// Owner:  each posted operation holds one reference; refused, it is dropped and its reference stays, by
-//         design.
+// Owner:  each posted operation holds one reference; if the queue refuses it, it is dropped and its
+//         reference is kept. // Compat: refused-post
 // Thread: any, except that the blocking reads wait for the render thread and so must not be called on it.
 #pragma once
 
@@ -22,10 +22,10 @@ public:
     ~MKScreenBitmap() override;
 
     void ActivateFrameBuffer() override;
-    // Does nothing, unlike ActivateFrameBuffer; relied upon.
+    // Does nothing, unlike ActivateFrameBuffer. // Compat: screen-deactivate
     void DeactivateFrameBuffer(DiscardFramebufferType) override {}
 
-    // Always 0, after it has read the pixel: relied upon. GetPixelAsync delivers it.
+    // Reads the pixel and returns 0. GetPixelAsync delivers it. // Compat: screen-pixel
     unsigned int GetPixel(Point const& p) override;
     void GetPixelAsync(Point const& p, void* userData, PixelCallback callback) override;
     void GetBitmapData(Rect const& r, void* destination) override;

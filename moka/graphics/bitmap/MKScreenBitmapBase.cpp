@@ -70,7 +70,7 @@ unsigned int MKScreenBitmapBase::ReadPixel(Point const& p) {
     int const width = GetWidth();
     int const height = GetHeight();
     if (!mRenderTarget || p.x < 0 || p.x > width || p.y < 0 || p.y > height) return pixel;
-    // Rows are one off, and row 0 lies outside and reads 0. Callers rely on it; it must not be repaired.
+    // Compat: screen-pixel-row
     int const x = p.x - (p.x == width ? 1 : 0);
     int const y = height - p.y + (p.y == height ? 1 : 0);
     mRenderTarget->ReadPixels(x, y, 1, 1, {&pixel, 1, 0, 0});
@@ -80,8 +80,7 @@ unsigned int MKScreenBitmapBase::ReadPixel(Point const& p) {
 void MKScreenBitmapBase::ReadBlock(Rect const& r, void* destination) {
     Rect const i = r.Intersect(GetBitmapRect());
     if (i.IsEmpty() || !destination || !mRenderTarget) return;
-    // The rows come as the frame buffer has them, bottom row first, and the bitmap's place does not enter.
-    // Callers rely on it.
+    // Compat: screen-rows
     mRenderTarget->ReadPixels(i.left, i.top, i.GetWidth(), i.GetHeight(),
                               {destination, r.GetWidth(), i.top - r.top, i.left - r.left});
 }

@@ -4,9 +4,9 @@
 //         counts a reference.
 // Thread: the getters anywhere; everything ending in RT, and the protected bodies, on the render thread.
 // Fails:  without a render target (an unknown type gives one error line) nothing is drawn or read.
-// Units:  GetBitmapData gives the frame buffer's own rows, the bottom one first, counted from its corner, not from
-//         where the bitmap lies. GetPixel counts from the top but is one row off: row y reads row y - 1, and row
-//         0 reads 0.
+// Units:  GetBitmapData gives the frame buffer's own rows, the bottom one first, counted from its corner, not
+//         from where the bitmap lies. GetPixel counts from the top but is one row off: row y reads row y - 1,
+//         and row 0 reads 0.
 // Limits: there is no stencil of ours: clips that need one (turned ones, and all operations but Intersect and
 //         Replace) do not work on a screen bitmap.
 #pragma once
@@ -23,8 +23,8 @@ class MOKA_API MKScreenBitmapBase : public MKBitmap,
                                     public IMKBitmapWritable,
                                     public IMKBitmapCanvasAttachable {
 public:
-    // Over the same rectangle, always caller-side, and over the other of the two frame buffers: the type goes
-    // where the factory takes a switch. Both are relied upon.
+    // The same rectangle, always caller-side, over the other of the two frame buffers: the type is passed
+    // where the factory takes a switch. // Compat: screen-clone
     IMKBitmap* Clone() override;
 
     IMKBitmapWritable* GetBitmapWritable() override { return this; }

@@ -194,8 +194,7 @@ IMKSubBitmap* MKSubBitmap::Clone() {
     clone->CreateFrameBuffer();
     PostSelf(&MKSubBitmap::copyTextureRT, clone);
     clone->SetTag(CopyTag().Get());
-    // Whether a canvas is attached to this strip decides whether the clone keeps its frame buffer: only when
-    // none is. It looks backwards; callers rely on it.
+    // Compat: strip-clone
     if (mFrameBuffer) clone->ReleaseFrameBuffer();
     return clone;
 }

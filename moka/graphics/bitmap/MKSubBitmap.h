@@ -1,6 +1,6 @@
 // MKSubBitmap: a strip for use from any thread: each operation is posted to the render thread.
 // Owner:  each posted operation holds one reference. Refused, the operation is dropped and its reference
-//         stays: the strip then lives for good, by design.
+//         stays: the strip is then never deleted. // Compat: refused-post
 // Thread: any, except that the blocking reads wait for the render thread and so must not be called on it.
 // Cost:   one task a call; nothing is copied but the arguments, so pixels and destinations stay valid until
 //         run.

@@ -187,8 +187,7 @@ unsigned int MKSubBitmapBase::ReadPixel(Point const& p) {
     unsigned int pixel = 0;
     int const width = GetWidth();
     int const height = GetHeight();
-    // Measured against the size, not the rectangle's edges, and inclusive: (width, height) reads the last
-    // pixel, and rows of lower strips read 0. Callers rely on both; it must not be repaired.
+    // Compat: pixel-bounds
     if (p.x < 0 || p.x > width || p.y < 0 || p.y > height) return pixel;
     CreateFrameBufferRT(false);
     int const x = p.x - (p.x == width ? 1 : 0) - mRect.left;

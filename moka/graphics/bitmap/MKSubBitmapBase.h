@@ -84,7 +84,7 @@ protected:
 
     // Present from the first request to the last detach, and never without a frame buffer: the frame buffer's
     // last release deletes it but leaves the count, so that requests still open stay counted. While they are,
-    // a new frame buffer gets none.
+    // a new frame buffer gets none. // Compat: depth-stencil-count
     std::unique_ptr<MKDepthStencilBuffer> mDepthStencil;
     int mDepthStencilCount = 0; // requests still open
 

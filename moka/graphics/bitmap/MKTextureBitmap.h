@@ -86,7 +86,7 @@ public:
     void SetTextureFilter(TextureParamFiltering kind, TextureParamFilteringValue value) override;
     void SetTextureWrap(TextureParamWrappingValue value) override;
     void SetTextureWrap(TextureParamWrapping kind, TextureParamWrappingValue value) override;
-    // These four ignore release and never drop a reference, unlike the other RT operations; relied upon.
+    // These four ignore release and never drop a reference. // Compat: sampling-release
     void SetTextureFilterRT(TextureParamFilteringValue value, bool release) override;
     void SetTextureFilterRT(TextureParamFiltering kind, TextureParamFilteringValue value,
                             bool release) override;

@@ -1,6 +1,7 @@
 // CanvasFrontEnd: the caller's side of every canvas: clearing, the matrix, clips, the save stack, the
-// tag. DrawingCanvas (MKCanvas.h) and PenCanvas (MKPenCanvas.h) add their operations to it. kPosts tells their
-// two flavours apart: true posts each request to the render thread, false calls the render side at once.
+// tag. DrawingCanvas (MKCanvas.h) and PenCanvas (MKPenCanvas.h) add their operations to it. kPosts tells
+// their two flavours apart: true posts each request to the render thread, false calls the render side at
+// once.
 // Owner:  holds the render side, which dies on the render thread.
 // Thread: one at a time; not posting, the render thread.
 // Fails:  without a render side (memory ran out, or the target does not suit) the local state works on, and
@@ -24,9 +25,9 @@ public:
     int clipCount = 0; // clips requested, whether or not the queue took them
     Tag tag;
 
-    // The index of the new level. A part that the flag leaves out gets its value in the level below, or the
-    // identity or 0 without one, so that restoring resets it. When memory runs out there is no new level, and
-    // restoring to the index does nothing.
+    // Returns the index of the new level. A part that the flag leaves out gets its value in the level below,
+    // or the identity or 0 without one, so that restoring resets it. When memory runs out there is no new
+    // level, and restoring to the index does nothing. // Compat: save-one-part
     int Save(IMKCanvasBase::SaveFlag flag);
     // False, and nothing changes, for a level that does not exist. A negative one is the last.
     bool Restore(int level);

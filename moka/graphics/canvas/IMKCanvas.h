@@ -5,7 +5,7 @@
 // Thread: as IMKCanvasBase.
 // Units:  pixels before the current matrix, which scales widths, anti-aliasing fringes and dashes too.
 // Fails:  silently: nothing is drawn for shapes without extent, null sources, or when the queue refuses.
-// The order of the operations is part of the contract.
+// The vtable order is ABI.
 #pragma once
 
 #include "moka/base/Point.h"
@@ -40,9 +40,9 @@ public:
     virtual void DrawRoundRect(RectF const& rect, float rx, float ry, MKPaint const* paint) = 0;
     virtual void DrawCircle(float cx, float cy, float radius, MKPaint const* paint) = 0;
 
-    // Screen bitmaps cannot be sampled and are not drawn. Without src the source rectangle is (GetX(), GetY())
-    // to (GetWidth(), GetHeight()). It differs from the bitmap's own rectangle if the bitmap does not lie at
-    // the origin.
+    // Screen bitmaps cannot be sampled and are not drawn. Without src the source rectangle is (GetX(),
+    // GetY()) to (GetWidth(), GetHeight()). It differs from the bitmap's own rectangle if the bitmap does not
+    // lie at the origin.
     virtual void DrawBitmap(IMKBitmap* bitmap, float x, float y, MKPaint const* paint) = 0;
     virtual void DrawBitmap(IMKBitmap* bitmap, RectF const& dst, MKPaint const* paint) = 0;
     virtual void DrawBitmap(IMKBitmap* bitmap, RectF const& src, RectF const& dst, MKPaint const* paint) = 0;

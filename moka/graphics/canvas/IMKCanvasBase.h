@@ -3,7 +3,7 @@
 // Owner:  reference counted; a creating function returns one reference to its caller.
 // Thread: a caller-side canvas from one thread at a time, a render-thread canvas on the render thread.
 // Units:  pixels of the target, origin top left, y down; angles in degrees, positive turns +x towards +y.
-// The order of the operations is part of the contract.
+// The vtable order is ABI.
 #pragma once
 
 #include "moka/graphics/math/Matrix3.h"

@@ -9,7 +9,7 @@
 //
 // Owner:  as IMKCanvasBase.
 // Thread: as IMKCanvasBase; the clip operations on the render thread.
-// The order of the operations is part of the contract.
+// The vtable order is ABI.
 #pragma once
 
 #include "moka/graphics/canvas/IMKCanvasBase.h"

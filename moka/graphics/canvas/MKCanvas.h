@@ -4,7 +4,7 @@
 // Thread: any, one at a time.
 // Cost:   each call posts one task. Only calls that take a vector also copy it.
 // Fails:  requests that the queue refuses are dropped. References that a request took on a bitmap or a
-//         drawable are then not given back, by design.
+//         drawable are then kept. // Compat: refused-post
 #pragma once
 
 #include "moka/graphics/canvas/CanvasFrontEnd.h"

@@ -21,7 +21,7 @@ void LogStencilClip(IMKBitmap* bitmap) {
     __android_log_print(ANDROID_LOG_WARN, "mok_log",
                         "!CLIPPING PERFORMANCE WARNING! MKCanvasClipping::EnableClip Stencil Clip. This "
                         "clipping mode can cause significant performance penalties");
-    // The spelling is what log filters look for.
+    // Compat: clip-log
     __android_log_print(ANDROID_LOG_WARN, "mok_log", "Stencil clipping was activateted for bitmap: %s",
                         bitmap->GetTag());
 }

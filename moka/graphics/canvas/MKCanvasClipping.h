@@ -26,7 +26,8 @@ public:
 
     bool HasClips() const { return !mClips.empty(); }
     void AddClipRectRT(ClipInfo const& info);
-    // Keeps the first ones. More than there are adds empty ones, which let nothing through.
+    // Keeps the first ones. A count above the current one adds empty clips, which hide everything.
+    // Compat: removed-clips
     void RemoveClipRectRT(int count);
 
     // For the draw that follows, into a strip, or with -1 into the target as one frame buffer. Activates it

@@ -4,7 +4,7 @@
 // Thread: render thread; the constructor, without onRenderThread, on any.
 // Units:  pixels before the matrix, which the GPU applies: positions reach it as they are.
 // Cost:   a drawable is made at the first request that needs it. Strip culling uses
-//         the mapped corners only and ignores stroke width and fringe.
+//         the mapped corners only and ignores stroke width and fringe. // Compat: culling
 // Fails:  silently; a drawable whose making failed is tried again by the next request. Exceptions of a
 //         shader's constructor pass through, after the request has released all that it held.
 #pragma once
@@ -31,8 +31,8 @@ public:
     MKCanvasImpl(IGLMsgQueue* queue, IMKBitmap* bitmap, bool onRenderThread);
     ~MKCanvasImpl() override;
 
-    // Drops one reference on the drawable. Every frame buffer is drawn, each as index -1: so a clip that
-    // needs the stencil does not work on texture bitmaps here. Relied upon.
+    // Drops one reference on the drawable. Draws onto every frame buffer, each as index -1, so stencil clips
+    // do not cut it on texture bitmaps. // Compat: whole-frame-buffer
     void DrawRT(IMKCustomDrawable* drawable, Matrix3<float> const& m, MKPaint const& paint);
 
     void DrawLineRT(PointF const& a, PointF const& b, Matrix3<float> const& m, MKPaint const& paint);
@@ -47,7 +47,7 @@ public:
     // clamped at its edges.
     void DrawBitmapRT(IMKBitmap* src, RectF const& srcRect, RectF const& dstRect, Matrix3<float> const& m,
                       MKPaint const& paint);
-    // Takes the vector over. Reaches the first strips only, as index -1. Relied upon.
+    // Deletes the vector. Uses the first strips only, as index -1. // Compat: first-strips
     void DrawBitmapsRT(IMKBitmap* src, RectF const& srcRect, std::vector<RectF>* dstRects,
                        Matrix3<float> const& m, MKPaint const& paint);
 

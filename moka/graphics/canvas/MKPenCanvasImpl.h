@@ -18,7 +18,7 @@ public:
     Matrix4<float> GetCanvasMatrix() const;
 
     // Without a frame buffer no clip is made, and an error line says so.
-    // A pen canvas draws into the bitmap as one frame buffer, whatever the index. Relied upon.
+    // Uses the bitmap as one frame buffer, whatever the index. // Compat: whole-frame-buffer
     void EnableClipRT(int frameBuffer);
     void DisableClipRT();
 

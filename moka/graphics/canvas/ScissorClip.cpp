@@ -18,6 +18,7 @@ struct Edges {
 
 bool IsReplace(ClipInfo const& clip) { return clip.op == IMKCanvasBase::Replace; }
 
+// Compat: rotation-test
 bool IsUpright(ClipInfo const& clip) { return clip.matrix[3] == 0; }
 
 // No target reaches further; and the distance of two such edges is still an int.
@@ -26,8 +27,7 @@ int ToEdge(std::int64_t value) {
     return static_cast<int>(std::clamp(value, -kFar, kFar - 1));
 }
 
-// The order of operations and the truncations decide which rows and columns a fraction falls into: the top
-// edge 8.25 becomes row 9. Relied upon.
+// Compat: scissor-rounding
 Edges GetEdges(ClipInfo const& clip, int targetY, int targetHeight) {
     float const sx = clip.matrix[0];
     float const sy = clip.matrix[4];
@@ -55,7 +55,7 @@ std::size_t FirstRelevant(ClipList const& clips) {
 }
 
 bool IsScissorEnough(ClipList const& clips) {
-    if (clips.size() == 1) return IsUpright(clips.front());
+    if (clips.size() == 1) return IsUpright(clips.front()); // Compat: single-clip
     if (IsReplace(clips.back()) && IsUpright(clips.back())) return true;
     return std::all_of(clips.begin(), clips.end(), [](ClipInfo const& clip) {
         return (clip.op == IMKCanvasBase::Intersect || IsReplace(clip)) && IsUpright(clip);

@@ -27,7 +27,7 @@ public:
     }
 
     void SetMatrix(Matrix3<float> const& m) override { Checked().SetMatrix(m); }
-    // Pure in a checker, which can be made all the same; relied upon.
+    // Ends the process. // Compat: checker-pure
     Matrix3<float> GetMatrix() override { EndAsPureVirtual(); }
     void PreConcat(Matrix3<float> const& m) override { Checked().PreConcat(m); }
     void PostConcat(Matrix3<float> const& m) override { Checked().PostConcat(m); }
@@ -40,7 +40,7 @@ public:
     void PreTranslate(float tx, float ty) override { Checked().PreTranslate(tx, ty); }
     void PostTranslate(float tx, float ty) override { Checked().PostTranslate(tx, ty); }
 
-    // What was set through the checker, whatever tag the canvas has itself; relied upon.
+    // The tag set through the checker, not the canvas's own. // Compat: checker-tag
     char const* GetTag() override {
         this->checkRefCount();
         return this->GetOwnTag();

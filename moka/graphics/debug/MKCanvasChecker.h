@@ -1,6 +1,6 @@
 // MKCanvasChecker: a canvas that hands every call on to another one while it is referenced, and throws
 // "Canvas was already released!!" afterwards. Owner, Thread, Fails: see Checker.h.
-// GetMatrix and GetBitmap end the process, as calls to pure virtual functions do; relied upon.
+// GetMatrix and GetBitmap end the process, as calls to pure virtual functions do. // Compat: checker-pure
 #pragma once
 
 #include "moka/graphics/canvas/IMKCanvas.h"

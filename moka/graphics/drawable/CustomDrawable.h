@@ -1,8 +1,8 @@
 // CustomDrawable: the base of the custom drawables: the life of the GPU objects, which are made and released
 // on the render thread while the drawable itself is made and dropped anywhere, and the bitmaps drawn.
 // Owner:  reference counted; the creator holds the first reference, the task that makes the GPU objects one
-//         more. A queue that refuses that task leaves a drawable that draws nothing and lives for good, by
-//         design; one that refuses a release leaks that object.
+//         more. If a queue refuses that task, the drawable draws nothing and is never deleted; if it refuses
+//         a release, that object leaks. // Compat: refused-post
 // Thread: construction, destruction and setters on the caller's thread, DrawRT on the render thread. Setters
 //         are not synchronised. They also affect draws that are posted but not yet run.
 // Fails:  silently: without GPU objects, or without a bitmap that can be sampled, DrawRT touches nothing.
@@ -43,6 +43,8 @@ protected:
     // with DrawVertices.
     Shader& Begin(void const* vertices, int count, IMKBitmapReadable* tiled, MKPaint const& paint);
     void DrawVertices();
+    // For drawables that draw several times with the same uniforms.
+    IGraphicsObject& GetGraphics();
 
     RefPtr<IMKBitmap> mBitmap;
     RefPtr<IMKBitmap> mSecondBitmap; // of those that have two

@@ -1,7 +1,7 @@
 // IMKCustomDrawable: something that draws itself onto a canvas: IMKCanvas::Draw() hands it over.
 // Owner:  reference counted; each request holds one reference until it has been drawn.
 // Thread: DrawRT on the render thread, the references from any.
-// The order of the operations is part of the contract.
+// The vtable order is ABI.
 #pragma once
 
 #include "moka/graphics/math/Matrix4.h"

@@ -31,7 +31,7 @@ bool IsDarkenOrLighten(MKPaint const& paint) {
     return paint.GetXFermode() == MKPaint::Darken || paint.GetXFermode() == MKPaint::Lighten;
 }
 
-// The right edge adds the bounds' left one; callers depend on it.
+// Compat: right-edge
 RectF TextureCoordinates(RectF const& bounds, RectF const& src) {
     float const width = bounds.GetWidth();
     float const height = bounds.GetHeight();

@@ -14,8 +14,8 @@ class MKBlenderBitmapsShader;
 
 class MOKA_API MKBlendedBitmapDrawable final : public detail::CustomDrawable<MKBlenderBitmapsShader> {
 public:
-    // Takes the caller's references on the bitmaps over, unlike the setters. A size of 0
-    // by 0 becomes that of the first bitmap at the next draw, and stays so.
+    // Takes over the caller's references on the bitmaps; the setters take their own. A size of 0 by 0 becomes
+    // that of the first bitmap at the next draw and stays so. // Compat: blend-size
     MKBlendedBitmapDrawable(IGLMsgQueue* queue, IMKBitmap* first, IMKBitmap* second, RectF const& src,
                             RectF const& dst, float width, float height);
     ~MKBlendedBitmapDrawable() override;

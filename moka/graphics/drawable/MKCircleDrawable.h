@@ -24,7 +24,7 @@ public:
     MKCircleDrawable();
     virtual ~MKCircleDrawable();
 
-    // Strokes of any positive width are drawn, unlike those of other shapes, which need 1. Relied upon.
+    // Draws strokes of any positive width; other shapes need 1. // Compat: thin-strokes
     void DrawCircleRT(PointF const& center, float radius, Matrix4<float> const& projection,
                       MKPaint const& paint);
 

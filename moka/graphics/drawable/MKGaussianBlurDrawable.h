@@ -20,7 +20,7 @@ public:
     // Takes a reference.
     void SetBitmap(IMKBitmap* bitmap) { Hold(mBitmap, bitmap); }
 
-    // Horizontal unless set otherwise. The name's spelling is the interface.
+    // Horizontal unless set otherwise. // Compat: misspelt-names
     void SetHorizotalDirection(bool horizontal) { mHorizontal = horizontal; }
 
     // The distance of the nine samples from each other; 1 unless set.

@@ -28,7 +28,7 @@ constexpr Factors kFactors[] = {
     {F::OneMinusDstAlpha, F::SrcAlpha, F::One, F::Zero},          // DstAtop
     {F::Zero, F::SrcAlpha, F::Zero, F::SrcAlpha},                 // DstIn
     {F::Zero, F::OneMinusSrcAlpha, F::Zero, F::OneMinusSrcAlpha}, // DstOut
-    // DstOver: the alpha factors differ from the colour factors; existing pictures depend on it.
+    // DstOver: the alpha factors differ from the colour factors. // Compat: dst-over-alpha
     {F::OneMinusDstAlpha, F::One, F::OneMinusSrcAlpha, F::One},
     {F::Zero, F::SrcColor, F::Zero, F::SrcAlpha},                    // Modulate
     {F::One, F::Zero, F::One, F::Zero},                              // Src

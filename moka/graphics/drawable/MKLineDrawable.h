@@ -37,7 +37,7 @@ public:
                           MKPaint const& paint);
 
     // Points in pairs; an odd last one is ignored. Deletes the vector. If the line is narrower than 1, the
-    // caller keeps the vector.
+    // caller keeps the vector. // Compat: points-ownership
     void DrawSimpleLinesRT(std::vector<PointF>* points, Matrix4<float> const& projection,
                            MKPaint const& paint);
 

@@ -39,8 +39,8 @@ public:
                                    bool deleteBuffer, int useQueue, bool textureFlag);
 
     // The part of such an image that region covers, at its place in a bitmap of the full size; null when it
-    // covers none. Two oddities stay, because hosts call it so: the result is always caller-side, and useQueue 0
-    // means that the bitmap owns the pixels.
+    // covers none. The result is always caller-side; useQueue 0 means that the bitmap owns the pixels.
+    // Compat: region-creation
     static IMKBitmap* CreateBitmap(IGLMsgQueue* queue, Rect const& region, int width, int height,
                                    void const* pixels, int useQueue);
 

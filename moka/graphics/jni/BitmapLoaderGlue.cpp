@@ -35,7 +35,7 @@ void BitmapLoader_OnLoad(JavaVM*, JNIEnv* env) {
     using Moka::kOnLoadName;
     __android_log_print(ANDROID_LOG_INFO, "mok_log", "BitmapLoader %s JNI_OnLoad enter!", kOnLoadName);
     jclass const type = env->FindClass("com/velmora/android/sdk/pen/graphics/MokaBitmapLoader");
-    // No blank behind the name in these two; log readers rely on it.
+    // No blank follows the name in these two: log filters search for these texts.
     if (!type) {
         __android_log_print(ANDROID_LOG_ERROR, "mok_log", "BitmapLoader %sCannot find BitmapLoader Class",
                             kOnLoadName);

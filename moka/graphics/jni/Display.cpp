@@ -55,7 +55,7 @@ void Display::Copy(Display const* source) {
     mAppVsyncOffsetNanos = source->GetAppVsyncOffsetNanos();
 }
 
-// A density of 0 makes any positive side endless, and so a tablet's; relied upon.
+// Compat: tablet-density
 bool Display::ComputeIsTabletUX() const {
     return static_cast<float>(std::min(mLocalWidthPixels, mLocalHeightPixels)) / mSystemDensity >=
            kTabletSide;

@@ -35,8 +35,8 @@ public:
     bool IsUWP() const override { return mIsUWP; }
     long long GetAppVsyncOffsetNanos() const override { return mAppVsyncOffsetNanos; }
 
-    // Takes over what source's getters say, all but two: the dots per inch and whether it is a tablet stay
-    // this display's own. Relied upon. A null source changes nothing.
+    // Copies the values that source's getters return, except the dots per inch and IsTablet. A null source
+    // changes nothing. // Compat: display-copy
     void Copy(Display const* source);
     void UpdateScreenOrientation(ScreenOrientation orientation) { mScreenOrientation = orientation; }
     void SetDebugLevel(int level) { mDebugLevel = level; }

@@ -1,5 +1,5 @@
 // IDisplay: the device's screen as the Java side describes it, for native code to read. Sizes are in pixels,
-// densities are factors unless named dpi. The order of the operations is relied upon by other libraries.
+// densities are factors unless named dpi. The vtable order is ABI.
 #pragma once
 
 namespace Moka {

@@ -19,9 +19,9 @@ public:
     BitmapLoader(char const* name, Callback* callback);
     ~BitmapLoader() override;
 
-    // Saves the bitmap's own pixels, rows packed, which the loader frees with array delete afterwards: the
-    // bitmap must not (SetDeleteBuffer(false)). Deliberate. False, with the pixels still the bitmap's, when
-    // it has none or memory runs out.
+    // Saves the bitmap's own pixels, rows packed. The loader frees them with array delete afterwards, so the
+    // bitmap must not: SetDeleteBuffer(false). False, with the pixels still the bitmap's, when it has none or
+    // memory runs out. // Compat: saved-pixels
     bool RequestSave(int id, String const& path, Bitmap& bitmap, void* userData, int quality);
     using LoaderFrontEnd::RequestSave;
 };

@@ -37,7 +37,7 @@ bool MKBitmapSaveManager::RequestSave(int id, String const& path, IMKBitmap& bit
     return save && mLoader && mLoader->RequestSave(id, path, bitmap, save, quality);
 }
 
-// A save that the loader refuses afterwards stays here and stays counted; relied upon.
+// A save that the loader refuses afterwards stays here and stays counted. // Compat: refused-save
 MKBitmapSaveManager::Save* MKBitmapSaveManager::AddSave(String const& path,
                                                         SaveCallback const* callback) const {
     SaveList added;

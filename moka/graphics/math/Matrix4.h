@@ -6,8 +6,6 @@
 //          degrees.)
 // Numbers: single precision, operation by operation in a fixed order; the determinant in double precision.
 //          Nothing is guarded: a division by zero gives what IEEE 754 gives.
-// The direction of the axis-angle rotation, what rotate() resets and rotateSelf() keeps, and the spelling of
-// calculaeMatrix are relied upon and must not be repaired.
 // Instantiated for float only.
 #pragma once
 
@@ -41,7 +39,7 @@ public:
     int storageSize() const { return sizeof(mElements); } // bytes
     bool isRowMajor() const { return false; }
 
-    // By bits, not by value: 0 and -0 differ, a NaN equals itself. Callers rely on it as "unchanged".
+    // Compares bits, not values: 0 and -0 differ, a NaN equals itself. // Compat: bitwise-equality
     bool operator==(Matrix4 const& other) const;
     bool operator!=(Matrix4 const& other) const { return !(*this == other); }
 
@@ -56,8 +54,8 @@ public:
     static Matrix4 scaleMatrix(Vector3<T> const& factors);
     // Rx(ax) * Ry(ay) * Rz(az): z acts first.
     static Matrix4 rotateMatrix(T ax, T ay, T az);
-    // Turns points by minus the angle about the axis, which need not be of unit length. Callers rely on the
-    // direction: not to be repaired.
+    // Rotates points by minus the angle about the axis, which need not be of unit length.
+    // Compat: axis-angle-direction
     static Matrix4 rotateMatrix(T angle, Vector3<T> const& axis);
     // The columns are the unit vectors along dir x up, (dir x up) x dir, and dir.
     static Matrix4 rotateMatrix(Vector3<T> dir, Vector3<T> up);
@@ -68,6 +66,7 @@ public:
     void inverseSelf();
     Matrix4 inverse() const;
     // The sixteen terms of the adjugate, not divided by the determinant, in storage order.
+    // Compat: misspelt-names
     void calculaeMatrix(double* terms) const;
 
     void transposeSelf();
@@ -81,7 +80,8 @@ public:
 
     // The Euler rotation with this translation: what else this holds is discarded, not composed.
     Matrix4 rotate(T ax, T ay, T az) const;
-    // Overwrites the upper left 3x3 only. Unlike rotate() it keeps m3, m7, m11 and m15: not to be repaired.
+    // Overwrites the upper left 3x3 only. Unlike rotate() it keeps m3, m7, m11 and m15.
+    // // Compat: rotate-self
     void rotateSelf(T ax, T ay, T az);
 
 private:

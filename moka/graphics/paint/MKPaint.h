@@ -27,7 +27,7 @@ public:
         SrcAtop = 9,
         SrcIn = 10,
         SrcOut = 11,
-        SrcOver = 12, // premultiplied; also what any number above 18 means
+        SrcOver = 12, // premultiplied; any other number, negative ones included, means this
         SrcKeepDstAlpha = 13,
         SrcNonPremultiplied = 14,
         SrcOverNonPremultiplied = 15,

@@ -1,6 +1,6 @@
 // IGLMsgQueue: the way onto the render thread. The host implements it and hands it to every creating call.
 // Thread: both operations from any thread, at once.
-// The order of the operations is part of the contract.
+// The vtable order is ABI. // Compat: vtable-order
 #pragma once
 
 namespace Moka {

@@ -2,8 +2,10 @@
 // and the functions that post them.
 //
 // Arguments are stored by value, in the decayed type of the parameter. A reference parameter is bound to the
-// task's own copy: what a function writes through it is lost with the task, which callers rely on. A by-value
-// parameter gets a fresh copy. The object and whatever a stored pointer points to are not owned.
+// task's own copy: a result that a function writes through it is lost with the task.
+// A by-value parameter gets a fresh copy. The task owns neither the object nor the targets of stored
+// pointers.
+// Compat: reference-arguments
 #pragma once
 
 #include "moka/graphics/task/IGLMsgQueue.h"
@@ -108,8 +110,8 @@ inline bool PostOrDestroy(IGLMsgQueue* queue, ITask* task) {
     return false;
 }
 
-// Posts object->function(values...). What the caller did ahead of it (a reference taken for the task) is not
-// undone when the queue refuses: the object then stays alive for good, by design.
+// Posts object->function(values...). If the queue refuses, a reference that the caller took for the task is
+// kept, so the object is never deleted. // Compat: refused-post
 template <class T, class F, class... Values>
 bool PostMember(IGLMsgQueue* queue, T* object, F function, Values&&... values) {
     using Task = typename detail::TaskFor<T, F>::Type;

@@ -151,7 +151,10 @@ void GlDevice::Commit(StateCommit const& commit) {
     if (commit.scissorTest) state.SetScissorTest(*commit.scissorTest);
     if (commit.scissorRect) state.SetScissorRect(ToGlBox(*commit.scissorRect));
     if (commit.blend) state.SetBlend(*commit.blend);
-    if (commit.depthStencil) state.SetDepthStencil(*commit.depthStencil);
+    if (commit.depthStencil) {
+        host.SaveObstacles();
+        state.SetDepthStencil(*commit.depthStencil);
+    }
     if (commit.program != 0) programs.Apply(commit.program, commit.values);
     for (std::size_t i = 0; i < commit.textureCount; ++i) BindTexture(commit.textures[i]);
 }

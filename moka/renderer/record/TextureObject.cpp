@@ -14,7 +14,7 @@
 namespace Moka::detail {
 namespace {
 
-constexpr ObjectKind kKind = ObjectKind::kTexture;
+constexpr ObjectKind kTextureKind = ObjectKind::kTexture;
 
 bool IsWrap(int value) {
     return value == TextureWrapRepeat || value == TextureWrapClampToEdge ||
@@ -56,12 +56,12 @@ TextureObject::TextureObject(std::shared_ptr<TextureStorage> storage) : mStorage
 }
 
 TextureObject::~TextureObject() {
-    Observe(kKind, static_cast<ITextureObject*>(this), "Release");
+    Observe(kTextureKind, static_cast<ITextureObject*>(this), "Release");
     mStorage->GetRecorder()->DropTextureObject();
 }
 
 void TextureObject::SetLabel(char const* text) {
-    Observe(kKind, static_cast<ITextureObject*>(this), "SetLabel", text ? text : "");
+    Observe(kTextureKind, static_cast<ITextureObject*>(this), "SetLabel", text ? text : "");
     try {
         mLabel = text ? text : "";
     } catch (std::bad_alloc const&) {
@@ -72,7 +72,7 @@ void TextureObject::SetLabel(char const* text) {
 }
 
 void TextureObject::Bind(int unit) {
-    Observe(kKind, static_cast<ITextureObject*>(this), "Bind", unit);
+    Observe(kTextureKind, static_cast<ITextureObject*>(this), "Bind", unit);
     Recorder& recorder = *mStorage->GetRecorder();
     if (!recorder.Begin()) return;
     int const count = recorder.requested->GetUnitCount();
@@ -93,12 +93,12 @@ void TextureObject::Bind(int unit) {
 }
 
 void TextureObject::Replace(void const* pixels, int stride) {
-    Observe(kKind, static_cast<ITextureObject*>(this), "Replace", pixels ? "pixels" : "null", stride);
+    Observe(kTextureKind, static_cast<ITextureObject*>(this), "Replace", pixels ? "pixels" : "null", stride);
     Upload(Rect(0, 0, GetWidth(), GetHeight()), pixels, stride);
 }
 
 void TextureObject::Replace(Rect const& rect, void const* pixels, int stride) {
-    Observe(kKind, static_cast<ITextureObject*>(this), "Replace", rect.left, rect.top, rect.right,
+    Observe(kTextureKind, static_cast<ITextureObject*>(this), "Replace", rect.left, rect.top, rect.right,
             rect.bottom, pixels ? "pixels" : "null", stride);
     Upload(rect, pixels, stride);
 }
@@ -126,7 +126,7 @@ void TextureObject::Upload(Rect const& rect, void const* pixels, int stride) {
 }
 
 void TextureObject::DrawToCurrent() {
-    Observe(kKind, static_cast<ITextureObject*>(this), "DrawToCurrent");
+    Observe(kTextureKind, static_cast<ITextureObject*>(this), "DrawToCurrent");
     Recorder& recorder = *mStorage->GetRecorder();
     RequestScope const scope(recorder);
     if (!scope || IsActiveTarget()) return;
@@ -139,7 +139,7 @@ void TextureObject::DrawToCurrent() {
 }
 
 void TextureObject::SetParameter(int id, int value) {
-    Observe(kKind, static_cast<ITextureObject*>(this), "SetParameter", id, value);
+    Observe(kTextureKind, static_cast<ITextureObject*>(this), "SetParameter", id, value);
     Store(id, value);
 }
 
@@ -152,7 +152,7 @@ void TextureObject::Store(int id, int value) {
 }
 
 void TextureObject::CopyFromRenderTarget() {
-    Observe(kKind, static_cast<ITextureObject*>(this), "CopyFromRenderTarget");
+    Observe(kTextureKind, static_cast<ITextureObject*>(this), "CopyFromRenderTarget");
     Recorder& recorder = *mStorage->GetRecorder();
     RequestScope const scope(recorder);
     if (!scope || IsActiveTarget()) return;

@@ -17,7 +17,7 @@ float onEllipse(vec2 radii) {
     return squares.x + squares.y;
 }
 
-// The ramps between two ellipses are as wide as their x radii say, on both axes. Relied upon.
+// The x radii give the width of the ramp on both axes. // Compat: corner-ramp
 float rampWidth(float outer, float inner) {
     return (outer * outer) / (inner * inner) - 1.0;
 }

@@ -1,0 +1,38 @@
+// Hand: writes and sketches on a pen canvas, with the uneven, joined strokes of a hand.
+// Units: pixels, y down; at is the left end of the baseline.
+#pragma once
+
+#include "scenes/ScenePen.h"
+
+#include <string>
+#include <vector>
+
+namespace Moka::Scenes {
+
+using Path = std::vector<InkPoint>; // through which a stroke goes; the radius is the stroke's
+
+struct Ink {
+    Vector4<float> color; // premultiplied
+    float width = 2;
+    float xHeight = 20; // of a small letter
+    float slant = 0.22f;
+};
+
+class Hand {
+public:
+    Hand(ScenePen& pen, IMKPenCanvas& canvas) : mPen(pen), mCanvas(canvas) {}
+
+    // Small letters, digits, spaces, commas and full stops.
+    void Write(std::string const& text, float x, float y, Ink const& ink);
+    // A smooth line through pairs of x and y, in one string: "10 20 30 40". Twice is how a hand sketches.
+    void Sketch(char const* points, float x, float y, Ink const& ink);
+
+private:
+    void Trace(Path const& path, Ink const& ink);
+
+    ScenePen& mPen;
+    IMKPenCanvas& mCanvas;
+    unsigned mSeed = 1; // of the unevenness
+};
+
+} // namespace Moka::Scenes
