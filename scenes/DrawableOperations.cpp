@@ -25,14 +25,14 @@ SceneOperation ReadBlendedBitmap(SceneFields& fields, SceneNames const& names) {
     std::size_t const first = GetBitmap(fields, names, "first");
     std::size_t const second = GetBitmap(fields, names, "second");
     SceneValue const* const size = fields.Find("size");
-    return DrawMade(GetPaint(fields, names),
-                    [=, src = fields.GetRect("src"), dst = fields.GetRect("dst"),
-                     by = size ? ReadPoint(*size) : PointF()](SceneBitmaps const& bitmaps) {
-                        // Takes these references over.
-                        return new (std::nothrow) MKBlendedBitmapDrawable(
-                            bitmaps.queue, RefPtr<IMKBitmap>(bitmaps[first]).Release(),
-                            RefPtr<IMKBitmap>(bitmaps[second]).Release(), src, dst, by.x, by.y);
-                    });
+    return DrawMade(
+        GetPaint(fields, names), [=, src = fields.GetRect("src"), dst = fields.GetRect("dst"),
+                                  by = size ? ReadPoint(*size) : PointF()](SceneBitmaps const& bitmaps) {
+            // Takes these references over.
+            return new (std::nothrow)
+                MKBlendedBitmapDrawable(bitmaps.queue, RefPtr<IMKBitmap>(bitmaps[first]).Release(),
+                                        RefPtr<IMKBitmap>(bitmaps[second]).Release(), src, dst, by.x, by.y);
+        });
 }
 
 SceneOperation ReadGaussianBlur(SceneFields& fields, SceneNames const& names) {
@@ -40,26 +40,25 @@ SceneOperation ReadGaussianBlur(SceneFields& fields, SceneNames const& names) {
     SceneValue const* const horizontal = fields.Find("horizontal");
     SceneValue const* const amount = fields.Find("amount");
     SceneValue const* const offset = fields.Find("offset");
-    return DrawMade(
-        GetPaint(fields, names),
-        [=, isHorizontal = !horizontal || ReadBool(*horizontal), by = amount ? ReadFloat(*amount) : 1.0f,
-         shift = offset ? ReadPoint(*offset) : PointF()](SceneBitmaps const& bitmaps) {
-            auto* const blur = new (std::nothrow) MKGaussianBlurDrawable(bitmaps.queue);
-            if (!blur) return blur;
-            blur->SetBitmap(bitmaps[bitmap].Get());
-            blur->SetHorizotalDirection(isHorizontal);
-            blur->SetBlurAmount(by);
-            blur->SetOffset(shift.x, shift.y);
-            return blur;
-        });
+    return DrawMade(GetPaint(fields, names),
+                    [=, isHorizontal = !horizontal || ReadBool(*horizontal),
+                     by = amount ? ReadFloat(*amount) : 1.0f,
+                     shift = offset ? ReadPoint(*offset) : PointF()](SceneBitmaps const& bitmaps) {
+                        auto* const blur = new (std::nothrow) MKGaussianBlurDrawable(bitmaps.queue);
+                        if (!blur) return blur;
+                        blur->SetBitmap(bitmaps[bitmap].Get());
+                        blur->SetHorizotalDirection(isHorizontal);
+                        blur->SetBlurAmount(by);
+                        blur->SetOffset(shift.x, shift.y);
+                        return blur;
+                    });
 }
 
 SceneOperation ReadNonPremultipliedColor(SceneFields& fields, SceneNames const& names) {
     std::size_t const src = GetBitmap(fields, names, "src");
     std::size_t const dst = GetBitmap(fields, names, "dst");
     return DrawMade(GetPaint(fields, names), [=](SceneBitmaps const& bitmaps) {
-        auto* const drawable =
-            new (std::nothrow) MKNonPremultipliedColorDrawable(bitmaps.queue);
+        auto* const drawable = new (std::nothrow) MKNonPremultipliedColorDrawable(bitmaps.queue);
         if (drawable) drawable->SetBitmap(bitmaps[src].Get(), bitmaps[dst].Get());
         return drawable;
     });
@@ -67,14 +66,14 @@ SceneOperation ReadNonPremultipliedColor(SceneFields& fields, SceneNames const& 
 
 SceneOperation ReadTextMask(SceneFields& fields, SceneNames const& names) {
     std::size_t const bitmap = GetBitmap(fields, names);
-    return DrawMade(GetPaint(fields, names), [=, x = fields.GetFloat("x"),
-                                              y = fields.GetFloat("y")](SceneBitmaps const& bitmaps) {
-        auto* const mask = new (std::nothrow) MKTextMaskBitmapDrawable(bitmaps.queue);
-        if (!mask) return mask;
-        mask->SetBitmap(bitmaps[bitmap].Get());
-        mask->SetDstPosition(x, y);
-        return mask;
-    });
+    return DrawMade(GetPaint(fields, names),
+                    [=, x = fields.GetFloat("x"), y = fields.GetFloat("y")](SceneBitmaps const& bitmaps) {
+                        auto* const mask = new (std::nothrow) MKTextMaskBitmapDrawable(bitmaps.queue);
+                        if (!mask) return mask;
+                        mask->SetBitmap(bitmaps[bitmap].Get());
+                        mask->SetDstPosition(x, y);
+                        return mask;
+                    });
 }
 
 SceneOperation ReadLeftOut(SceneFields& fields, SceneNames const&) {

@@ -101,8 +101,9 @@ SceneLine& SceneLine::Add(char const* key, std::vector<PointF> const& points) {
 }
 
 SceneLine& SceneLine::Add(char const* key, std::vector<RectF> const& rects) {
-    return AddList(key, rects,
-                   [](RectF const& r) { return std::array<float, 4>{r.left, r.top, r.right, r.bottom}; });
+    return AddList(key, rects, [](RectF const& r) {
+        return std::array<float, 4>{r.left, r.top, r.right, r.bottom};
+    });
 }
 
 SceneLine& SceneLine::Add(char const* key, std::vector<std::array<float, 3>> const& items) {

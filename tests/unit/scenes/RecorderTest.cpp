@@ -41,7 +41,7 @@ protected:
 
     // Of a scene without bitmaps.
     static void Draw(Scene const& scene, IMKCanvas& canvas) {
-        EmptyStage stage;
+        ReferenceStage stage;
         scene.draw(canvas, stage);
     }
 
