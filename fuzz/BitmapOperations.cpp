@@ -30,28 +30,29 @@ bool IsSmall(Rect const& r) {
     return r.IsEmpty() || (r.GetWidth() <= 2 * kMaxSide && r.GetHeight() <= 2 * kMaxSide);
 }
 
+// A bitmap of pixels that it owns once it is made, of the world's, or of none.
+template <class Create>
+void MakeOfPixels(CanvasWorld& world, Slot<IMKBitmap>& slot, int width, int height, int flags,
+                  Create const& create) {
+    bool const hasPixels = (flags & 2) != 0 && width > 0 && height > 0;
+    bool const passesPixels = (flags & 4) != 0;
+    std::size_t const count = hasPixels ? CountBytes(width, height) : 0;
+    auto own = std::make_unique<unsigned char[]>(hasPixels && passesPixels ? count : 0);
+    unsigned char* const pixels = passesPixels ? own.get() : world.NewBuffer(count);
+    world.Make(slot, (flags & 1) != 0,
+               [&](int useQueue) { return create(hasPixels ? pixels : nullptr, passesPixels, useQueue); });
+    if (slot.object && hasPixels && passesPixels) static_cast<void>(own.release());
+}
+
 void MakeBitmap(CanvasWorld& world) {
     Slot<IMKBitmap>& slot = world.PickBitmap();
     int const flags = world.input.Byte();
     int const width = ReadSide(world.input);
     int const height = ReadSide(world.input);
-    bool const onRenderThread = (flags & 1) != 0;
-    bool const withPixels = (flags & 2) != 0;
-    bool const passesPixels = (flags & 4) != 0;
-    std::unique_ptr<unsigned char[]> own;
-    unsigned char const* pixels = nullptr;
-    if (withPixels && width > 0 && height > 0) {
-        own = std::make_unique<unsigned char[]>(CountBytes(width, height));
-        pixels = passesPixels ? own.get() : world.NewBuffer(CountBytes(width, height));
-    }
-    RefPtr<IMKBitmap> made;
-    {
-        ThreadScope const scope(onRenderThread);
-        made = RefPtr<IMKBitmap>::Adopt(MKGraphicsFactory::CreateBitmap(
-            &world.queue, width, height, pixels, passesPixels, onRenderThread ? 0 : 1, (flags & 8) != 0));
-    }
-    if (made && passesPixels) static_cast<void>(own.release());
-    slot.Put(std::move(made), onRenderThread);
+    MakeOfPixels(world, slot, width, height, flags, [&](auto* pixels, bool passes, int useQueue) {
+        return MKGraphicsFactory::CreateBitmap(&world.queue, width, height, pixels, passes, useQueue,
+                                               (flags & 8) != 0);
+    });
 }
 
 void MakeRegion(CanvasWorld& world) {
@@ -59,47 +60,30 @@ void MakeRegion(CanvasWorld& world) {
     int const width = ReadSide(world.input);
     int const height = ReadSide(world.input);
     Rect const region = ReadRect(world.input);
-    bool const passesPixels = world.input.Bool();
-    std::unique_ptr<unsigned char[]> own;
-    unsigned char const* pixels = nullptr;
-    if (width > 0 && height > 0) {
-        own = std::make_unique<unsigned char[]>(CountBytes(width, height));
-        pixels = passesPixels ? own.get() : world.NewBuffer(CountBytes(width, height));
-    }
-    IMKBitmap* const made =
-        MKGraphicsFactory::CreateBitmap(&world.queue, region, width, height, pixels, passesPixels ? 0 : 1);
-    if (made && passesPixels) static_cast<void>(own.release());
-    slot.Put(RefPtr<IMKBitmap>::Adopt(made), false);
+    int const flags = world.input.Bool() ? 6 : 2;
+    MakeOfPixels(world, slot, width, height, flags, [&](auto* pixels, bool passes, int) {
+        return MKGraphicsFactory::CreateBitmap(&world.queue, region, width, height, pixels, passes ? 0 : 1);
+    });
 }
 
 void MakeScreen(CanvasWorld& world) {
     Slot<IMKBitmap>& slot = world.PickBitmap();
     int const flags = world.input.Byte();
-    bool const onRenderThread = (flags & 1) != 0;
     int const x = world.input.Int();
     int const y = world.input.Int();
     int const width = ReadSide(world.input);
     int const height = ReadSide(world.input);
-    RefPtr<IMKBitmap> made;
-    {
-        ThreadScope const scope(onRenderThread);
-        made = RefPtr<IMKBitmap>::Adopt(MKGraphicsFactory::CreateScreenBitmap(
-            &world.queue, x, y, width, height, flags & 2, onRenderThread ? 0 : 1));
-    }
-    slot.Put(std::move(made), onRenderThread);
+    world.Make(slot, (flags & 1) != 0, [&](int useQueue) {
+        return MKGraphicsFactory::CreateScreenBitmap(&world.queue, x, y, width, height, flags & 2, useQueue);
+    });
 }
 
 void MakeShared(CanvasWorld& world) {
     Slot<IMKBitmap>& slot = world.PickBitmap();
     bool const onRenderThread = world.input.Bool();
     IMKBitmap* const parent = world.PickBitmapFor(onRenderThread);
-    RefPtr<IMKBitmap> made;
-    {
-        ThreadScope const scope(onRenderThread);
-        made = RefPtr<IMKBitmap>::Adopt(
-            MKGraphicsFactory::CreateBitmap(&world.queue, parent, onRenderThread ? 0 : 1));
-    }
-    slot.Put(std::move(made), onRenderThread);
+    world.Make(slot, onRenderThread,
+               [&](int useQueue) { return MKGraphicsFactory::CreateBitmap(&world.queue, parent, useQueue); });
 }
 
 // Of a render-thread bitmap the clone is caller-side, and dropped last it would end the other on this thread.
@@ -113,8 +97,6 @@ void ShareBitmap(CanvasWorld& world) {
     Slot<IMKBitmap> const from = world.PickBitmap();
     world.PickBitmap().Put(from.object, from.onRenderThread);
 }
-
-void DropBitmap(CanvasWorld& world) { world.PickBitmap().Drop(); }
 
 void UpdateBitmap(CanvasWorld& world) {
     Slot<IMKBitmap> const& slot = world.PickBitmap();
@@ -167,7 +149,7 @@ void SetSampling(CanvasWorld& world) {
         IMKBitmapReadable* const readable = bitmap.GetBitmapReadable();
         if (!readable) return;
         if (filters)
-            readable->SetTextureFilter(static_cast<TextureParamFilteringValue>(value & 1));
+            readable->SetTextureFilter(static_cast<TextureParamFilteringValue>(value));
         else
             readable->SetTextureWrap(static_cast<TextureParamWrappingValue>(value));
     });
@@ -179,16 +161,24 @@ void TagBitmap(CanvasWorld& world) {
     Use(slot, [&](IMKBitmap& b) { b.SetTag(world.input.Bool() ? tag.c_str() : b.GetTag()); });
 }
 
-void FailACreation(CanvasWorld& world) { Testing::RendererTrace::FailCreation(1 + world.input.Below(16)); }
-
-void RunQueue(CanvasWorld& world) { world.queue.RunAll(); }
-
 } // namespace
 
 std::vector<Operation> const& GetBitmapOperations() {
     static std::vector<Operation> const operations = {
-        MakeBitmap,   MakeRegion, MakeScreen, MakeShared,  CloneBitmap, ShareBitmap,   DropBitmap,
-        UpdateBitmap, ReadPixel,  ReadBlock,  SetSampling, TagBitmap,   FailACreation, RunQueue};
+        MakeBitmap,
+        MakeRegion,
+        MakeScreen,
+        MakeShared,
+        CloneBitmap,
+        ShareBitmap,
+        [](CanvasWorld& world) { world.PickBitmap().Drop(); },
+        UpdateBitmap,
+        ReadPixel,
+        ReadBlock,
+        SetSampling,
+        TagBitmap,
+        [](CanvasWorld& world) { Testing::RendererTrace::FailCreation(1 + world.input.Below(16)); },
+        [](CanvasWorld& world) { world.queue.RunAll(); }};
     return operations;
 }
 

@@ -15,32 +15,17 @@ Matrix3<float> ReadMatrix(FuzzInput& input) {
     return matrix;
 }
 
-template <class Canvas, class Create>
-void Make(CanvasWorld& world, Slot<Canvas>& slot, Create const& create) {
+template <class Canvas>
+void Make(CanvasWorld& world, Slot<Canvas>& slot, Canvas* (*create)(IGLMsgQueue*, IMKBitmap*, int)) {
     bool const onRenderThread = world.input.Bool();
     IMKBitmap* const target = world.PickBitmapFor(onRenderThread);
-    RefPtr<Canvas> made;
-    {
-        ThreadScope const scope(onRenderThread);
-        made = RefPtr<Canvas>::Adopt(create(&world.queue, target, onRenderThread ? 0 : 1));
-    }
-    slot.Put(std::move(made), onRenderThread);
-}
-
-void MakeCanvas(CanvasWorld& world) { Make(world, world.PickCanvas(), MKGraphicsFactory::CreateCanvas); }
-
-void MakePenCanvas(CanvasWorld& world) {
-    Make(world, world.PickPenCanvas(), MKGraphicsFactory::CreatePenCanvas);
+    world.Make(slot, onRenderThread, [&](int useQueue) { return create(&world.queue, target, useQueue); });
 }
 
 void ShareCanvas(CanvasWorld& world) {
     Slot<IMKCanvas> const from = world.PickCanvas();
     world.PickCanvas().Put(from.object, from.onRenderThread);
 }
-
-void DropCanvas(CanvasWorld& world) { world.PickCanvas().Drop(); }
-
-void DropPenCanvas(CanvasWorld& world) { world.PickPenCanvas().Drop(); }
 
 using Step = void (*)(IMKCanvasBase& canvas, FuzzInput& input);
 
@@ -72,11 +57,6 @@ void ChangeCanvas(CanvasWorld& world) {
     Use(world.PickCanvas(), [&](IMKCanvas& canvas) { DoOne(kSteps, world.input, canvas, world.input); });
 }
 
-void ChangePenCanvas(CanvasWorld& world) {
-    Use(world.PickPenCanvas(),
-        [&](IMKPenCanvas& canvas) { DoOne(kSteps, world.input, canvas, world.input); });
-}
-
 // As foreign code does it.
 void UsePen(CanvasWorld& world) {
     Slot<IMKPenCanvas> const& slot = world.PickPenCanvas();
@@ -98,8 +78,21 @@ void UsePen(CanvasWorld& world) {
 
 std::vector<Operation> const& GetCanvasOperations() {
     static std::vector<Operation> const operations = {
-        MakeCanvas,   MakePenCanvas, ShareCanvas,  DropCanvas,   DropPenCanvas,   ChangeCanvas,
-        ChangeCanvas, ChangeCanvas,  ChangeCanvas, ChangeCanvas, ChangePenCanvas, UsePen};
+        [](CanvasWorld& world) { Make(world, world.PickCanvas(), MKGraphicsFactory::CreateCanvas); },
+        [](CanvasWorld& world) { Make(world, world.PickPenCanvas(), MKGraphicsFactory::CreatePenCanvas); },
+        ShareCanvas,
+        [](CanvasWorld& world) { world.PickCanvas().Drop(); },
+        [](CanvasWorld& world) { world.PickPenCanvas().Drop(); },
+        ChangeCanvas,
+        ChangeCanvas,
+        ChangeCanvas,
+        ChangeCanvas,
+        ChangeCanvas,
+        [](CanvasWorld& world) {
+            Use(world.PickPenCanvas(),
+                [&](auto& canvas) { DoOne(kSteps, world.input, canvas, world.input); });
+        },
+        UsePen};
     return operations;
 }
 

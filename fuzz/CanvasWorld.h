@@ -68,6 +68,17 @@ public:
     Slot<IMKPenCanvas>& PickPenCanvas() { return Pick(penCanvases); }
     Slot<IMKCustomDrawable>& PickDrawable() { return Pick(drawables); }
 
+    // Into a slot, on the thread that it is for; create is told whether to use the queue.
+    template <class T, class Create>
+    void Make(Slot<T>& slot, bool onRenderThread, Create const& create) {
+        RefPtr<T> made;
+        {
+            ThreadScope const scope(onRenderThread);
+            made = RefPtr<T>::Adopt(create(onRenderThread ? 0 : 1));
+        }
+        slot.Put(std::move(made), onRenderThread);
+    }
+
     // A bitmap that an object of this flavour may use; null when the picked one is of the other.
     IMKBitmap* PickBitmapFor(bool onRenderThread);
 

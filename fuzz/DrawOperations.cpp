@@ -47,49 +47,15 @@ void ReadPaint(FuzzInput& input, MKPaint& paint) {
     paint.SetAntiAliasing((flags & 128) != 0);
 }
 
-// A canvas and what to draw with: null stands for a new paint.
-class Draw {
-public:
-    explicit Draw(CanvasWorld& world)
-        : input(world.input), mSlot(world.PickCanvas()), mScope(mSlot.onRenderThread) {
-        mHasPaint = input.Bool();
-        if (mHasPaint) ReadPaint(input, mPaint);
-    }
-
-    explicit operator bool() const { return static_cast<bool>(mSlot.object); }
-    IMKCanvas* Get() const { return mSlot.object.Get(); }
-    MKPaint const* GetPaint() const { return mHasPaint ? &mPaint : nullptr; }
-    bool IsOnRenderThread() const { return mSlot.onRenderThread; }
-
-    FuzzInput& input;
-
-private:
-    Slot<IMKCanvas> const& mSlot;
-    ThreadScope const mScope;
-    MKPaint mPaint;
-    bool mHasPaint = false;
-};
-
-using Shape = void (*)(IMKCanvas& canvas, FuzzInput& input, MKPaint const* paint);
+using Shape = void (*)(IMKCanvas& canvas, FuzzInput& input, IMKBitmap* bitmap, MKPaint const* paint);
 
 Shape const kShapes[] = {
-    [](auto& c, auto& i, auto* paint) { c.DrawLine(ReadPoint(i), ReadPoint(i), paint); },
-    [](auto& c, auto& i, auto* paint) { c.DrawSimpleLine(ReadPoint(i), ReadPoint(i), paint); },
-    [](auto& c, auto& i, auto* paint) { c.DrawSimpleLines(ReadMany(i, ReadPoint), paint); },
-    [](auto& c, auto& i, auto* paint) { c.DrawRect(ReadRectF(i), paint); },
-    [](auto& c, auto& i, auto* paint) { c.DrawRoundRect(ReadRectF(i), i.Float(), i.Float(), paint); },
-    [](auto& c, auto& i, auto* paint) { c.DrawCircle(i.Float(), i.Float(), i.Float(), paint); },
-};
-
-void DrawShape(CanvasWorld& world) {
-    Draw draw(world);
-    MKPaint const* const paint = draw.GetPaint();
-    if (draw) DoOne(kShapes, draw.input, *draw.Get(), draw.input, paint);
-}
-
-using Image = void (*)(IMKCanvas& canvas, FuzzInput& input, IMKBitmap* bitmap, MKPaint const* paint);
-
-Image const kImages[] = {
+    [](auto& c, auto& i, auto*, auto* paint) { c.DrawLine(ReadPoint(i), ReadPoint(i), paint); },
+    [](auto& c, auto& i, auto*, auto* paint) { c.DrawSimpleLine(ReadPoint(i), ReadPoint(i), paint); },
+    [](auto& c, auto& i, auto*, auto* paint) { c.DrawSimpleLines(ReadMany(i, ReadPoint), paint); },
+    [](auto& c, auto& i, auto*, auto* paint) { c.DrawRect(ReadRectF(i), paint); },
+    [](auto& c, auto& i, auto*, auto* paint) { c.DrawRoundRect(ReadRectF(i), i.Float(), i.Float(), paint); },
+    [](auto& c, auto& i, auto*, auto* paint) { c.DrawCircle(i.Float(), i.Float(), i.Float(), paint); },
     [](auto& c, auto& i, auto* bitmap, auto* paint) { c.DrawBitmap(bitmap, i.Float(), i.Float(), paint); },
     [](auto& c, auto& i, auto* bitmap, auto* paint) { c.DrawBitmap(bitmap, ReadRectF(i), paint); },
     [](auto& c, auto& i, auto* bitmap, auto* paint) {
@@ -105,11 +71,21 @@ Image const kImages[] = {
     },
 };
 
-void DrawBitmap(CanvasWorld& world) {
-    Draw draw(world);
-    IMKBitmap* bitmap = world.PickBitmapFor(draw.IsOnRenderThread());
-    MKPaint const* const paint = draw.GetPaint();
-    if (draw) DoOne(kImages, draw.input, *draw.Get(), draw.input, bitmap, paint);
+// With a paint, or with null, which stands for a new one.
+template <class Action>
+void DrawWithPaint(CanvasWorld& world, Slot<IMKCanvas> const& slot, Action const& action) {
+    MKPaint paint;
+    bool const hasPaint = world.input.Bool();
+    if (hasPaint) ReadPaint(world.input, paint);
+    Use(slot, [&](IMKCanvas& canvas) { action(canvas, hasPaint ? &paint : nullptr); });
+}
+
+void DrawShape(CanvasWorld& world) {
+    Slot<IMKCanvas> const& slot = world.PickCanvas();
+    IMKBitmap* bitmap = world.PickBitmapFor(slot.onRenderThread);
+    DrawWithPaint(world, slot, [&](IMKCanvas& canvas, MKPaint const* paint) {
+        DoOne(kShapes, world.input, canvas, world.input, bitmap, paint);
+    });
 }
 
 IMKCustomDrawable* NewDrawable(CanvasWorld& world) {
@@ -144,24 +120,25 @@ IMKCustomDrawable* NewDrawable(CanvasWorld& world) {
                                        input.Float());
 }
 
-void MakeDrawable(CanvasWorld& world) {
-    Slot<IMKCustomDrawable>& slot = world.PickDrawable();
-    slot.Put(RefPtr<IMKCustomDrawable>::Adopt(NewDrawable(world)), false);
-}
-
-void DropDrawable(CanvasWorld& world) { world.PickDrawable().Drop(); }
-
 void DrawDrawable(CanvasWorld& world) {
     IMKCustomDrawable* const drawable = world.PickDrawable().object.Get();
-    Draw draw(world);
-    if (draw) draw.Get()->Draw(drawable, draw.GetPaint());
+    DrawWithPaint(world, world.PickCanvas(),
+                  [&](IMKCanvas& canvas, MKPaint const* paint) { canvas.Draw(drawable, paint); });
 }
 
 } // namespace
 
 std::vector<Operation> const& GetDrawOperations() {
-    static std::vector<Operation> const operations = {DrawShape,  DrawShape,    DrawShape,    DrawBitmap,
-                                                      DrawBitmap, MakeDrawable, DropDrawable, DrawDrawable};
+    static std::vector<Operation> const operations = {
+        DrawShape,
+        DrawShape,
+        DrawShape,
+        DrawShape,
+        [](CanvasWorld& world) {
+            world.PickDrawable().Put(RefPtr<IMKCustomDrawable>::Adopt(NewDrawable(world)), false);
+        },
+        [](CanvasWorld& world) { world.PickDrawable().Drop(); },
+        DrawDrawable};
     return operations;
 }
 

@@ -1,3 +1,4 @@
+#include "moka/graphics/drawable/MKStrokeDrawable.h"
 #include "scenes/SceneError.h"
 #include "scenes/SceneSteps.h"
 
@@ -91,6 +92,24 @@ SceneOperation ReadDrawSimpleLines(SceneFields& fields, SceneNames const& names)
             count};
 }
 
+SceneOperation ReadDrawStroke(SceneFields& fields, SceneNames const& names) {
+    SceneValue const& value = fields.Get("points");
+    if (value.kind != Kind::List) ThrowExpected(value, "a list of points, [x, y, width] each");
+    std::vector<MKStrokePoint> points;
+    for (SceneValue const& item : value.items) {
+        std::vector<float> const n = ReadFloats(item, 3, "[x, y, width]");
+        points.push_back({n[0], n[1], n[2]});
+    }
+    auto const count = static_cast<long long>(points.size());
+    return {[points = std::move(points), paint = GetPaint(fields, names)](IMKCanvas& canvas,
+                                                                          SceneBitmaps const& bitmaps) {
+                auto const stroke = RefPtr<MKStrokeDrawable>::Adopt(new MKStrokeDrawable(bitmaps.queue));
+                stroke->Append(points.data(), static_cast<int>(points.size()));
+                canvas.Draw(stroke.Get(), &paint);
+            },
+            count, true};
+}
+
 std::size_t GetBitmap(SceneFields& fields, SceneNames const& names) {
     SceneValue const& value = fields.Get("bitmap");
     auto const found = names.bitmaps.find(ReadText(value));
@@ -157,6 +176,7 @@ SceneOperationTable const& GetDrawingOperations() {
         {"DrawRect", ReadDrawRect},
         {"DrawRoundRect", ReadDrawRoundRect},
         {"DrawCircle", ReadDrawCircle},
+        {"DrawStroke", ReadDrawStroke},
         {"DrawBitmap", ReadDrawBitmap},
         {"DrawBitmaps", ReadDrawBitmaps},
     };

@@ -70,6 +70,16 @@ Texel Photo(Place const& p) {
     return t;
 }
 
+// Of three sizes, down to single pixels.
+Texel Grain(Place const& p) {
+    constexpr int kWeights[] = {5, 3, 1};
+    int grain = 0;
+    for (int i = 0; i < 3; ++i) grain += kWeights[i] * (Noise((p.x >> i) + 97 * i, p.y >> i) - 128);
+    Texel t = Photo(p);
+    for (int* const channel : {&t.r, &t.g, &t.b}) *channel = std::clamp(*channel + grain / 5, 0, 255);
+    return t;
+}
+
 // Five columns and seven rows of each letter, top row first, the leftmost column the highest bit.
 constexpr int kGlyphF[7] = {0b11111, 0b10000, 0b10000, 0b11110, 0b10000, 0b10000, 0b10000};
 constexpr int kGlyphR[7] = {0b11110, 0b10001, 0b10001, 0b11110, 0b10100, 0b10010, 0b10001};
@@ -109,8 +119,8 @@ struct Kind {
 };
 
 constexpr Kind kKinds[] = {
-    {"gradient", Gradient}, {"checker", Checker}, {"photo", Photo},
-    {"letters", Letters},   {"veil", Veil},       {"disc", Disc},
+    {"gradient", Gradient}, {"checker", Checker}, {"photo", Photo}, {"letters", Letters},
+    {"veil", Veil},         {"disc", Disc},       {"grain", Grain},
 };
 
 unsigned char Premultiply(int channel, int alpha) {

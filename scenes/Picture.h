@@ -64,6 +64,7 @@ private:
 // letters   "F" and "R" in two colours on nothing, so that any turn or mirror image shows
 // veil      stripes of four colours whose alpha grows from nothing on the left to opaque on the right
 // disc      a disc with a soft edge, white; for masks
+// grain     the landscape with coarse grain, down to single pixels; opaque
 std::vector<std::string> const& GetPictureNames();
 
 // index is that of GetPictureNames().

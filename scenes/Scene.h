@@ -54,8 +54,8 @@ struct Scene {
     SceneGroup group = SceneGroup::Rectangles;
     bool alsoInStrips = false; // worth seeing on a target of three strips as well
     bool onScreen = false;     // meant for a screen bitmap; draws on any target
-    bool needsGpu = false;     // makes objects of the GPU: only on a stage with a queue
-    bool needsPen = false;     // draws ink by foreign GL code: only on a stage with a pen
+    bool needsGpu = false; // makes objects of the GPU, or shows what drivers do: only on a stage with a queue
+    bool needsPen = false; // draws ink by foreign GL code: only on a stage with a pen
 
     // On a new canvas, over what its target holds. May leave a matrix, clips and saves.
     std::function<void(IMKCanvas&, SceneStage&)> draw;

@@ -3,6 +3,7 @@
 #include "moka/base/Bitmap.h"
 #include "moka/base/BitmapFactory.h"
 #include "moka/base/String.h"
+#include "moka/graphics/bitmap/IMKBitmapReadable.h"
 #include "scenes/Picture.h"
 #include "scenes/SceneError.h"
 #include "scenes/SceneSteps.h"
@@ -28,18 +29,34 @@ constexpr std::size_t kMaxBitmaps = 64;
 constexpr std::int64_t kMaxPicturePixels = std::int64_t{64} << 20; // 256 MiB
 constexpr std::uintmax_t kMaxFileBytes = 16u << 20;
 
+struct ScenePicture {
+    Picture picture;
+    TextureParamFilteringValue filter;
+};
+
 struct Content {
-    std::vector<Picture> pictures;
+    std::vector<ScenePicture> pictures;
     SceneNames names;
     SceneSteps steps;
 
     void Draw(IMKCanvas& canvas, SceneStage& stage) const {
         SceneBitmaps bitmaps;
-        for (Picture const& picture : pictures) {
-            bitmaps.push_back(RefPtr<IMKBitmap>::Adopt(stage.MakeBitmap(picture)));
+        bitmaps.queue = stage.GetQueue();
+        if (NeedsGpu() && !bitmaps.queue) throw SceneError("the scene draws on a GPU only");
+        for (ScenePicture const& one : pictures) {
+            bitmaps.push_back(RefPtr<IMKBitmap>::Adopt(stage.MakeBitmap(one.picture)));
             if (!bitmaps.back()) throw SceneError("there is no room for the scene's bitmaps");
+            if (one.filter != TextureFilterLinear)
+                bitmaps.back()->GetBitmapReadable()->SetTextureFilter(one.filter);
         }
         steps.Play(canvas, bitmaps);
+    }
+
+    // No two drivers filter mipmaps alike.
+    bool NeedsGpu() const {
+        return steps.needsGpu || std::any_of(pictures.begin(), pictures.end(), [](ScenePicture const& one) {
+                   return one.filter != TextureFilterLinear;
+               });
     }
 };
 
@@ -50,6 +67,7 @@ struct BitmapPlan {
     std::size_t kind = 0;
     int width = 0;
     int height = 0;
+    TextureParamFilteringValue filter = TextureFilterLinear;
 };
 
 [[noreturn]] void ThrowUnreadable(BitmapPlan const& plan, std::string const& reason) {
@@ -81,10 +99,19 @@ BitmapPlan PlanNamed(SceneFields& fields) {
             ReadInt(fields.Get("height"), 1, kMaxPictureSide)};
 }
 
+TextureParamFilteringValue ReadFilter(SceneValue const& value) {
+    static std::vector<std::string> const kFilters{"Nearest", "Linear", "Mipmapped"};
+    int const number = ReadEnum(value, kFilters);
+    if (number < 0 || number > TextureFilterMipmapped)
+        ThrowExpected(value, "Nearest, Linear or Mipmapped, or 0, 1 or 2");
+    return static_cast<TextureParamFilteringValue>(number);
+}
+
 BitmapPlan PlanBitmap(SceneValue const& value, std::string const& folder) {
     SceneFields fields(value);
     SceneValue const* const file = fields.Find("file");
     BitmapPlan plan = file ? PlanFile(*file, folder) : PlanNamed(fields);
+    if (SceneValue const* const filter = fields.Find("filter")) plan.filter = ReadFilter(*filter);
     fields.CheckAll();
     return plan;
 }
@@ -121,8 +148,9 @@ void ReadBitmaps(SceneValue const& value, std::string const& folder, Content& co
                                                       std::to_string(kMaxPicturePixels) + " pixels");
     }
     for (BitmapPlan const& plan : plans)
-        content.pictures.push_back(plan.path.empty() ? MakePicture(plan.kind, plan.width, plan.height)
-                                                     : LoadPicture(plan));
+        content.pictures.push_back(
+            {plan.path.empty() ? MakePicture(plan.kind, plan.width, plan.height) : LoadPicture(plan),
+             plan.filter});
 }
 
 void ReadPaints(SceneValue const& value, NamedPaints& paints) {
@@ -164,6 +192,7 @@ Scene ReadScene(SceneValue const& root, std::string const& folder) {
     if (SceneValue const* const value = fields.Find("paints")) ReadPaints(*value, content->names.paints);
     content->steps = ReadSteps(fields.Get("operations"), content->names);
     fields.CheckAll();
+    scene.needsGpu = content->NeedsGpu();
     scene.draw = [content](IMKCanvas& canvas, SceneStage& stage) { content->Draw(canvas, stage); };
     return scene;
 }

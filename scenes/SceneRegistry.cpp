@@ -35,6 +35,7 @@ constexpr Entry kEntries[] = {
     {"bitmap-whole", SceneGroup::Bitmaps},
     {"bitmap-parts", SceneGroup::Bitmaps},
     {"bitmap-turned", SceneGroup::Bitmaps},
+    {"bitmap-scaled", SceneGroup::Bitmaps},
     {"bitmap-tiles", SceneGroup::Bitmaps},
     {"bitmap-tall", SceneGroup::Bitmaps, true},
     {"bitmap-batch", SceneGroup::Bitmaps},
@@ -49,6 +50,7 @@ constexpr Entry kEntries[] = {
     {"round-rect-styles", SceneGroup::RoundRectangles},
     {"round-rect-radii", SceneGroup::RoundRectangles},
     {"round-rect-matrices", SceneGroup::RoundRectangles},
+    {"strokes", SceneGroup::CustomDrawables},
     {"screen", SceneGroup::Screen},
 };
 

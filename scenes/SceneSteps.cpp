@@ -90,7 +90,7 @@ SceneOperation ReadGroup(SceneFields& fields, SceneNames const& names) {
     group->content = ReadSteps(fields.Get("operations"), names);
     return {[group](IMKCanvas& canvas, SceneBitmaps const& bitmaps) { group->Play(canvas, bitmaps); },
             // What is empty takes time, too, when it is repeated.
-            std::max(1LL, group->content.count) * group->repeat};
+            std::max(1LL, group->content.count) * group->repeat, group->content.needsGpu};
 }
 
 SceneOperationReader FindReader(std::string const& name) {
@@ -131,6 +131,7 @@ SceneSteps ReadSteps(SceneValue const& value, SceneNames const& names) {
         SceneOperation operation = ReadOperation(item, names);
         result.count += std::max(1LL, operation.count);
         CheckCount(result.count, item);
+        result.needsGpu = result.needsGpu || operation.needsGpu;
         result.steps.push_back(std::move(operation.step));
     }
     return result;

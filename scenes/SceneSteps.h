@@ -11,17 +11,24 @@
 #include <string>
 #include <vector>
 
+namespace Moka {
+class IGLMsgQueue;
+}
+
 namespace Moka::Scenes {
 
 // Everything a scene draws, with repetitions counted as often as they are drawn.
 constexpr long long kMaxOperations = 1'000'000;
 
-using SceneBitmaps = std::vector<RefPtr<IMKBitmap>>;
+struct SceneBitmaps : std::vector<RefPtr<IMKBitmap>> {
+    IGLMsgQueue* queue = nullptr; // for steps that need a GPU
+};
 using SceneStep = std::function<void(IMKCanvas&, SceneBitmaps const&)>;
 
 struct SceneSteps {
     std::vector<SceneStep> steps;
-    long long count = 0; // operations when played once
+    long long count = 0;   // operations when played once
+    bool needsGpu = false; // see Scene::needsGpu
 
     void Play(IMKCanvas& canvas, SceneBitmaps const& bitmaps) const {
         for (SceneStep const& step : steps) step(canvas, bitmaps);
@@ -38,6 +45,7 @@ struct SceneNames {
 struct SceneOperation {
     SceneStep step;
     long long count = 1;
+    bool needsGpu = false;
 };
 
 using SceneOperationReader = SceneOperation (*)(SceneFields&, SceneNames const&);

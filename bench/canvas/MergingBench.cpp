@@ -1,6 +1,7 @@
 // Frames whose draws differ in what the renderer merges over: values, programs in turn, clips.
 #include "bench/canvas/BareComparison.h"
 #include "bench/canvas/BareShapes.h"
+#include "moka/base/log/AndroidLog.h"
 #include "moka/base/log/LogSink.h"
 
 #include <benchmark/benchmark.h>
@@ -31,9 +32,9 @@ enum class ClipLog { Dropped, Written };
 class ClipLogging {
 public:
     explicit ClipLogging(ClipLog log) {
-        if (log == ClipLog::Dropped) SetLogSink([](LogLine const&) {});
+        if (log == ClipLog::Dropped) SetLogPriority(ANDROID_LOG_ERROR);
     }
-    ~ClipLogging() { SetLogSink({}); }
+    ~ClipLogging() { SetLogPriority(ANDROID_LOG_INFO); }
 };
 
 void ClippedRects(benchmark::State& state, int clips, bool each, ClipLog log) {

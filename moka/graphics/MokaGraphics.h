@@ -26,6 +26,7 @@
 #include "moka/graphics/drawable/MKBlendedBitmapDrawable.h"
 #include "moka/graphics/drawable/MKGaussianBlurDrawable.h"
 #include "moka/graphics/drawable/MKNonPremultipliedColorDrawable.h"
+#include "moka/graphics/drawable/MKStrokeDrawable.h"
 #include "moka/graphics/drawable/MKTextMaskBitmapDrawable.h"
 #include "moka/graphics/factory/BitmapsAndCanvases.h"
 #include "moka/graphics/factory/MKGraphicsFactory.h"

@@ -4,7 +4,8 @@
 
 namespace Moka {
 
-enum class BlendingFactor {
+// One byte each: a descriptor is compared and copied for every draw.
+enum class BlendingFactor : unsigned char {
     Zero,
     One,
     SrcColor,
@@ -14,7 +15,7 @@ enum class BlendingFactor {
     OneMinusDstAlpha,
 };
 
-enum class BlendingFunction { Add };
+enum class BlendingFunction : unsigned char { Add };
 
 class BlendStateDescriptor {
 public:

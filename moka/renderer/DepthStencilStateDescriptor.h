@@ -46,13 +46,20 @@ public:
     StencilOperation GetDepthFail() const { return mDepthFail; }
     StencilOperation GetPass() const { return mPass; }
 
+    // Without a stencil test, what the test would do does not matter.
     friend bool operator==(DepthStencilStateDescriptor const& a, DepthStencilStateDescriptor const& b) {
-        return a.mDepth == b.mDepth && a.mStencil == b.mStencil && a.mComparison == b.mComparison &&
-               a.mReference == b.mReference && a.mReadMask == b.mReadMask && a.mWriteMask == b.mWriteMask &&
-               a.mStencilFail == b.mStencilFail && a.mDepthFail == b.mDepthFail && a.mPass == b.mPass;
+        if (a.mDepth != b.mDepth || a.mStencil != b.mStencil) return false;
+        return !a.mStencil || a.HasStencilOf(b);
     }
 
 private:
+    bool HasStencilOf(DepthStencilStateDescriptor const& b) const {
+        DepthStencilStateDescriptor const& a = *this;
+        return a.mComparison == b.mComparison && a.mReference == b.mReference && a.mReadMask == b.mReadMask &&
+               a.mWriteMask == b.mWriteMask && a.mStencilFail == b.mStencilFail &&
+               a.mDepthFail == b.mDepthFail && a.mPass == b.mPass;
+    }
+
     bool mDepth;
     bool mStencil;
     StencilComparison mComparison = StencilAlways;

@@ -30,6 +30,12 @@ struct RendererLimits {
     bool mergesDraws = true; // false: only draws of equal state and values become one draw call
 };
 
+// Pixels.
+struct RenderTargetSize {
+    int width = 0;
+    int height = 0;
+};
+
 // How the context's owner looks up entry points by name (eglGetProcAddress has this type).
 using RendererProcLoader = void (*(*)(char const* name))();
 
@@ -61,6 +67,9 @@ public:
     // moment.
     static IRenderTarget* CreateRenderTargetFromDefault(int width, int height);
     static IRenderTarget* CreateRenderTargetFromCurrent(int width, int height);
+
+    // Of the active target: its viewport is all of it. 0 x 0 without one.
+    static RenderTargetSize GetActiveTargetSize();
 
     static IDepthStencilBuffer* CreateDepthStencilBuffer(int width, int height);
 

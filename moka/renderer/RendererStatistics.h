@@ -85,6 +85,7 @@ struct RendererStatistics {
 
     std::uint64_t clears = 0;
     std::uint64_t copies = 0;
+    std::uint64_t mipmapUpdates = 0; // times that the levels of a texture were made
     std::uint64_t bytesUploaded = 0; // texels
     std::uint64_t vertexBytes = 0;
     std::uint64_t bytesReadBack = 0;

@@ -7,7 +7,14 @@ namespace Moka {
 enum TextureParamWrapping { TextureParamWrappingS = 0, TextureParamWrappingT = 1 };
 enum TextureParamFiltering { TextureParamFilteringMin = 4, TextureParamFilteringMag = 5 };
 
-enum TextureParamFilteringValue { TextureFilterNearest = 0, TextureFilterLinear = 1 };
+// Mipmapped: linear between texels and between the two levels nearest to the scale, so that a texture drawn
+// smaller than half its size has no speckles; magnified it is linear. The levels are made when the texture is
+// first drawn so, and again at the first such draw after its contents changed. They take a third more memory.
+enum TextureParamFilteringValue {
+    TextureFilterNearest = 0,
+    TextureFilterLinear = 1,
+    TextureFilterMipmapped = 2,
+};
 
 // 2 names no mode: it is refused with a log line.
 enum TextureParamWrappingValue {

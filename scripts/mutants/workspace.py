@@ -25,7 +25,7 @@ ENTRIES = {
     "moka_pixel_window_tests": ("tests/pixel/host", ("moka_pixel_window_tests",)),
     "moka_soak_gles": ("tests/trust", ("moka_soak_gles",)),
     "moka_soak_tracing": ("tests/trust", ("moka_soak_tracing",)),
-    "readme.Draw": ("tests/readme", ("moka_readme", "moka_readme_check")),
+    "readme.Draw": ("tests/readme", ("moka_readme", "moka")),
 }
 ANGLE = "angle:"  # before a program's name: on the second driver, as scripts/fetch-angle has brought it
 MEMORY_LIMIT = 16 << 30  # bytes of address space: a fault may allocate without end

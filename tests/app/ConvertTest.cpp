@@ -28,14 +28,6 @@ TEST_F(ConvertTest, EveryFormatBecomesEveryFormat) {
     }
 }
 
-TEST_F(ConvertTest, QualityReachesTheEncoder) {
-    Save(MakeAlphaPattern(61, 47), "in.png");
-    for (std::string const output : {"low.jpg", "low.webp"}) {
-        RunWell({"convert", "in.png", output, "--quality", "20"});
-        ExpectEncodes("in.png", output, 20);
-    }
-}
-
 TEST_F(ConvertTest, ADashIsStandardInputAndOutput) {
     Picture const image = MakeAlphaPattern(61, 47);
     Save(image, "in.webp");

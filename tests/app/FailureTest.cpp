@@ -17,37 +17,38 @@ protected:
     }
 };
 
-TEST_F(FailureTest, WrongUsage) {
-    ExpectFails({}, kUsage, {"convert or info", "moka --help"});
-    ExpectFails({"paint"}, kUsage, {"command 'paint'", "moka --help"});
-    ExpectFails({"--paint"}, kUsage, {"option '--paint'", "moka --help"});
-    ExpectFails({"info"}, kUsage, {"--device", "moka info --help"});
-    ExpectFails({"info", "--divice"}, kUsage, {"--divice", "moka info --help"});
-    ExpectFails({"convert"}, kUsage, {"INPUT", "moka convert --help"});
-    ExpectFails({"convert", "in.png"}, kUsage, {"OUTPUT"});
-    ExpectFails({"convert", "in.png", "out.mki", "third"}, kUsage, {"third"});
-    ExpectFails({"convert", "in.png", "out.mki", "--qualify", "3"}, kUsage, {"--qualify"});
-    ExpectFails({"convert", "", "out.mki"}, kUsage, {"empty"});
-    ExpectFails({"convert", "in.png", "out.mki", "--to", "webp"}, kUsage, {"--to needs --out"});
-    ExpectFails({"draw", "in.json", "-o", "out.png", "--to", "png"}, kUsage, {"out.png", "extension"});
-    ExpectFails({"draw", "--watch", "-", "-o", "out.png"}, kUsage, {"--watch"});
-    ExpectFails({"draw", "--watch", "in.json", "-o", "-"}, kUsage, {"--watch"});
-}
-
-TEST_F(FailureTest, BadNumbers) {
-    for (char const* const quality : {"-1", "101", "high", ""})
+TEST_F(FailureTest, WrongUsageIsToldWithWhatIsWrong) {
+    using Arguments = std::vector<std::string>;
+    struct {
+        Arguments arguments;
+        Arguments parts; // of the error line
+    } const cases[] = {
+        {{}, {"convert or info", "moka --help"}},
+        {{"paint"}, {"command 'paint'", "moka --help"}},
+        {{"--paint"}, {"option '--paint'", "moka --help"}},
+        {{"info", "--divice"}, {"--divice", "moka info --help"}},
+        {{"convert"}, {"INPUT", "moka convert --help"}},
+        {{"convert", "in.png"}, {"OUTPUT"}},
+        {{"convert", "in.png", "out.mki", "third"}, {"third"}},
+        {{"convert", "", "out.mki"}, {"empty"}},
+        {{"convert", "in.png", "out.bmp"}, {"out.bmp", ".webp"}},
+        {{"convert", "in.png", "folder.png/out"}, {"folder.png/out", ".webp"}},
+        {{"convert", "in.png", "out.mki", "--to", "webp"}, {"--to needs --out"}},
+        {{"draw", "in.json"}, {"-o", "moka draw --help"}},
+        {{"draw", "in.json", "-o", "out.png", "--to", "png"}, {"out.png", "extension"}},
+        {{"draw", "--watch", "-", "-o", "out.png"}, {"--watch"}},
+        {{"draw", "in.json", "-o", "-", "--statistics"}, {"--statistics", "name a file"}},
+        {{"gallery"}, {"--out"}},
+        {{"gallery", "--out", "g", "--only", "nonesuch"}, {"no scene 'nonesuch'"}},
+    };
+    for (auto const& [arguments, parts] : cases) ExpectFails(arguments, kUsage, parts);
+    for (char const* const quality : {"101", "high", ""})
         ExpectFails({"convert", "in.png", "out.jpg", "--quality", quality}, kUsage, {"--quality", quality});
-    for (char const* const side : {"0", "-4", "65536", "9999999999", "1.5"})
+    for (char const* const side : {"0", "-4", "65536", "1.5"})
         ExpectFails({"convert", "in.png", "out.jpg", "--max-texture", side}, kUsage, {"--max-texture", side});
-    for (char const* const size : {"12", "0x5", "5x0", "5x", "x5", "5x5x5", "-5x5", "65536x1",
-                                   "99999999999x1", "40000x40000", "5 x 5", "axb"})
+    for (char const* const size : {"12", "0x5", "5x", "5x5x5", "65536x1", "99999999999x1", "40000x40000"})
         ExpectFails({"convert", "in.png", "out.jpg", "--size", size}, kUsage,
                     {"--size", size, "WIDTHxHEIGHT"});
-}
-
-TEST_F(FailureTest, UnknownExtensions) {
-    for (char const* const name : {"out.bmp", "out", "png", "out.png.", "folder.png/out"})
-        ExpectFails({"convert", "in.png", name}, kUsage, {name, ".webp"});
 }
 
 TEST_F(FailureTest, InputsThatAreNoImage) {
@@ -104,7 +105,10 @@ TEST_F(FailureTest, NoDriver) {
     ExpectFails({"convert", "in.png", "old.png"}, kFailed, {"Install"}, WithoutDriver());
     ExpectFails({"convert", "in.png", "old.png", "--to", "mki", "--out", "."}, kFailed, {"Install"},
                 WithoutDriver());
-    ExpectFails({"info", "--device"}, kFailed, {"Install"}, WithoutDriver());
+    ExpectFails(
+        {"info", "--device"}, kFailed,
+        {"OpenGL ES 3.0", "Tried: ", "default display", "EGL_", "Install", "libegl1", "libgl1-mesa-dri"},
+        WithoutDriver());
 }
 
 TEST_F(FailureTest, WiderThanATexture) {

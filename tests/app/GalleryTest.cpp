@@ -92,12 +92,8 @@ TEST_F(GalleryTest, TheScreenLooksLikeATexture) {
     EXPECT_LE(CompareImages(screen, texture).differingPixels, 12);
 }
 
-TEST_F(GalleryTest, WrongUsageAndFoldersThatCannotBeMade) {
+TEST_F(GalleryTest, AFolderThatCannotBeMadeIsNamed) {
     WriteFile("file", "no folder");
-    ExpectFails({"gallery"}, kUsage, {"--out"});
-    ExpectFails({"gallery", "--out", "g", "--only", "nonesuch"}, kUsage, {"no scene 'nonesuch'"});
-    ExpectFails({"gallery", "--out", ""}, kUsage, {"empty"});
-    ExpectFails({"gallery", "--out", "file", "--only", "clips"}, kFailed, {"folder file"});
     ExpectFails({"gallery", "--out", "file/g", "--only", "clips"}, kFailed, {"folder file/g"});
 }
 

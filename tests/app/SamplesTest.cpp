@@ -1,5 +1,7 @@
-// The comparison of the demonstration sees every pixel.
+// Parts of programs that no run shows: the comparison of the demonstration, and which of several errors is told.
+#include "apps/moka/LogCollector.h"
 #include "apps/samples/Compare.h"
+#include "moka/base/log/AndroidLog.h"
 #include "tests/app/ToolTest.h"
 
 namespace Moka::Testing {
@@ -19,6 +21,13 @@ TEST_F(SamplesTest, ComparesEveryPixel) {
     EXPECT_EQ(Samples::Compare(Path("a.png"), Path("b.png")).differing, 2);
     EXPECT_FALSE(Samples::Compare(Path("a.png"), Path("turned.png")).isSameSize);
     EXPECT_FALSE(Samples::Compare(Path("a.png"), Path("none.png")).isRead);
+}
+
+TEST_F(SamplesTest, OfTwoErrorsTheFirstIsTheCause) {
+    Tool::LogCollector const log(false);
+    for (char const* const text : {"the cause", "a consequence"})
+        __android_log_print(ANDROID_LOG_ERROR, "test", "%s", text);
+    EXPECT_EQ(log.GetError(), "the cause");
 }
 
 } // namespace

@@ -96,17 +96,6 @@ protected:
     jclass mFactory = nullptr;
 };
 
-TEST_F(DecodeBridge, RefusesUntilItIsLoadedWhateverThePath) {
-    String const path("/a.png");
-    String const empty;
-    for (String const* any : {&path, &empty, static_cast<String const*>(nullptr)}) {
-        LogCapture log;
-        EXPECT_EQ(CreateBitmapJNI(any, 1, 1), nullptr);
-        EXPECT_THAT(log.GetTexts(), ElementsAre(kNotLoaded));
-        EXPECT_EQ(log.Count(ANDROID_LOG_ERROR), 1);
-    }
-}
-
 TEST_F(DecodeBridge, SaysWhatIsMissingAndGoesOnWithWhatIsThere) {
     constexpr char const* kEnter = "MKBitmapFactory JNI_OnLoad enter!!";
     constexpr char const* kSuccess = "MKBitmapFactory JNI_OnLoad Success";
@@ -146,47 +135,6 @@ TEST_F(DecodeBridge, SaysWhatIsMissingAndGoesOnWithWhatIsThere) {
     EXPECT_THAT(log.GetTexts(), ElementsAre(kEnter, "MKBitmapFactory Cannot find MokaBitmapFactory Class"));
 }
 
-TEST_F(DecodeBridge, HandsOverPathAndSizeAndTakesThePixels) {
-    Load();
-    // A surrogate pair, half of one, and a zero in the middle.
-    char16_t const text[] = {u'/', 0x00e9, 0xd83d, 0xde00, 0xd800, 0, u'.', u'p', u'n', u'g'};
-    String const path(text, static_cast<int>(std::size(text)));
-    jobject const javaBitmap = MakeJavaBitmap("ARGB_8888", "");
-    SetResult(javaBitmap);
-    LogCapture log;
-    BitmapOwner bitmap;
-    std::thread([&] { // which is attached for the call only
-        void* env = nullptr;
-        bitmap.reset(CreateBitmapJNI(&path, -7, 2000000000));
-        EXPECT_EQ(JavaMachine::GetVm()->GetEnv(&env, JNI_VERSION_1_6), JNI_EDETACHED);
-    })
-        .join();
-    EXPECT_EQ(GetString("path"), path);
-    EXPECT_EQ(GetString("size"), String("-7x2000000000"));
-    ASSERT_TRUE(bitmap);
-    EXPECT_EQ(bitmap->GetWidth(), 1);
-    EXPECT_EQ(bitmap->GetHeight(), 2);
-    EXPECT_EQ(bitmap->GetStride(), 4);
-    EXPECT_EQ(bitmap->GetFormat(), Bitmap::kFormatRgba8888);
-    EXPECT_TRUE(bitmap->GetDeleteBuffer());
-    EXPECT_EQ(Bytes(bitmap->GetBuffer(), bitmap->GetBuffer() + 8), (Bytes{10, 20, 30, 40, 0, 255, 1, 254}));
-    EXPECT_EQ(GetRecycled(javaBitmap), 1);
-    ASSERT_EQ(log.GetLines().size(), 1u);
-    EXPECT_EQ(log.GetLines()[0].format, "MKBitmapFactory::CreateBitmapJNI - filename[%s]");
-    EXPECT_THAT(log.GetLines()[0].text, HasSubstr("[/****"));
-}
-
-TEST_F(DecodeBridge, AsksNobodyWithoutAPath) {
-    Load();
-    String const empty;
-    LogCapture log;
-    EXPECT_EQ(CreateBitmapJNI(nullptr, 1, 1), nullptr);
-    EXPECT_EQ(CreateBitmapJNI(&empty, 1, 1), nullptr);
-    EXPECT_THAT(log.GetTexts(),
-                ElementsAre("MKBitmapFactory : filename NULL",
-                            "MKBitmapFactory::CreateBitmapJNI - filename[]", "MKBitmapFactory : filename 0"));
-}
-
 TEST_F(DecodeBridge, WhatJavaCannotReadTheBaseLibraryReads) {
     Load();
     String const good(mFolder.Path("bridge.webp"));
@@ -212,6 +160,35 @@ TEST_F(DecodeBridge, WhatJavaCannotReadTheBaseLibraryReads) {
     EXPECT_THAT(log.GetTexts(ANDROID_LOG_ERROR),
                 ElementsAre(HasSubstr("RGB_565"), "MKBitmapFactory : getMKBitmap false",
                             "MKBitmapFactory : recycle threw an exception"));
+}
+
+TEST_F(DecodeBridge, HandsOverPathAndSizeAndTakesThePixels) {
+    Load();
+    // A surrogate pair, half of one, and a zero in the middle.
+    char16_t const text[] = {u'/', 0x00e9, 0xd83d, 0xde00, 0xd800, 0, u'.', u'p', u'n', u'g'};
+    String const path(text, static_cast<int>(std::size(text)));
+    String const empty;
+    jobject const javaBitmap = MakeJavaBitmap("ARGB_8888", "");
+    SetResult(javaBitmap);
+    LogCapture log;
+    BitmapOwner bitmap;
+    std::thread([&] { // which is attached for the call only
+        void* env = nullptr;
+        bitmap.reset(CreateBitmapJNI(&path, -7, 2000000000));
+        EXPECT_EQ(JavaMachine::GetVm()->GetEnv(&env, JNI_VERSION_1_6), JNI_EDETACHED);
+    })
+        .join();
+    EXPECT_EQ(GetString("path"), path);
+    EXPECT_EQ(GetString("size"), String("-7x2000000000"));
+    ASSERT_TRUE(bitmap);
+    EXPECT_EQ(bitmap->GetWidth(), 1);
+    EXPECT_EQ(Bytes(bitmap->GetBuffer(), bitmap->GetBuffer() + 8), (Bytes{10, 20, 30, 40, 0, 255, 1, 254}));
+    EXPECT_EQ(GetRecycled(javaBitmap), 1);
+    EXPECT_EQ(CreateBitmapJNI(nullptr, 1, 1), nullptr);
+    EXPECT_EQ(CreateBitmapJNI(&empty, 1, 1), nullptr);
+    EXPECT_THAT(log.GetTexts(),
+                ElementsAre(HasSubstr("CreateBitmapJNI - filename[/****"), "MKBitmapFactory : filename NULL",
+                            "MKBitmapFactory::CreateBitmapJNI - filename[]", "MKBitmapFactory : filename 0"));
 }
 
 // On a thread that never returns to Java nobody else would end them.

@@ -79,24 +79,6 @@ TEST(Registration, FinalizeDestroysTheDisplay) {
     EXPECT_EQ(CountedDisplay::destroyed, 1);
 }
 
-// The VM itself hands natives 0 and 1 only.
-TEST(Registration, AnyTruthOfJavasMakesATablet) {
-    LoadDisplay(0);
-    auto* const init = GetNative<jlong(JNIEnv*, jclass, jint, jint, jfloat, jint, jint, jfloat, jfloat, jint,
-                                       jfloat, jfloat, jint, jint, jint, jboolean, jlong)>(0);
-    auto* const finalize = GetNative<void(JNIEnv*, jclass, jlong)>(1);
-    for (int truth : {0, 1, 2, 255}) {
-        jlong const handle =
-            init(nullptr, nullptr, 1, 1, 1, 1, 1, 1, 1, 1, 1, 1, 1, 1, 1, static_cast<jboolean>(truth), 0);
-        ASSERT_NE(handle, 0);
-        auto const* const display = reinterpret_cast<Display const*>(static_cast<std::intptr_t>(handle));
-        EXPECT_EQ(display->IsTablet(), truth != 0);
-        EXPECT_FALSE(display->IsUWP());
-        finalize(nullptr, nullptr, handle);
-    }
-    finalize(nullptr, nullptr, 0);
-}
-
 TEST(Registration, AVmThatIsTooOldIsRefused) {
     JNIInvokeInterface_ functions = {};
     JavaVM vm = {};

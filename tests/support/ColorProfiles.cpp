@@ -73,15 +73,6 @@ cmsHPROFILE MakeCmyk() {
     return profile;
 }
 
-cmsHPROFILE MakeLink() {
-    cmsHPROFILE const srgb = cmsCreate_sRGBProfile();
-    cmsHTRANSFORM const transform = cmsCreateTransform(srgb, TYPE_RGB_8, srgb, TYPE_RGB_8, 0, 0);
-    cmsHPROFILE const link = cmsTransform2DeviceLink(transform, 4.3, 0);
-    cmsDeleteTransform(transform);
-    cmsCloseProfile(srgb);
-    return link;
-}
-
 cmsHPROFILE Make(ProfileKind kind) {
     switch (kind) {
     case ProfileKind::Srgb:
@@ -92,8 +83,6 @@ cmsHPROFILE Make(ProfileKind kind) {
         return MakeGrey();
     case ProfileKind::Cmyk:
         return MakeCmyk();
-    case ProfileKind::Link:
-        return MakeLink();
     }
     return nullptr;
 }

@@ -14,7 +14,6 @@ enum class ProfileKind {
     DisplayP3,  // sRGB's curve, wider primaries
     LinearGrey, // numbers are light
     Cmyk,       // a table: paper is white, full black ink black, full cyan ink the colour L 50, a -40, b -40
-    Link,       // from sRGB to sRGB; of no device
 };
 FileBytes MakeProfile(ProfileKind kind);
 

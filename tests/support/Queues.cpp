@@ -103,14 +103,4 @@ int HandPumpedQueue::GetRunCount() const { return Count(&Counts::run); }
 int HandPumpedQueue::GetRefusedCount() const { return Count(&Counts::refused); }
 int HandPumpedQueue::GetWaitCount() const { return Count(&Counts::waits); }
 
-RefusingQueue::RefusingQueue() : RefusingQueue([](int, ITask*) { return true; }) {}
-
-RefusingQueue::RefusingQueue(std::set<int> ordinals)
-    : RefusingQueue(
-          [refused = std::move(ordinals)](int ordinal, ITask*) { return refused.count(ordinal) > 0; }) {}
-
-RefusingQueue::RefusingQueue(Predicate refuses) : mRefuses(std::move(refuses)) {}
-
-bool RefusingQueue::Accepts(int ordinal, ITask* task) { return !mRefuses(ordinal, task); }
-
 } // namespace Moka::Testing

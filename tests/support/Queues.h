@@ -8,7 +8,6 @@
 #include <functional>
 #include <memory>
 #include <mutex>
-#include <set>
 
 namespace Moka::Testing {
 
@@ -72,14 +71,12 @@ class RefusingQueue final : public HandPumpedQueue {
 public:
     using Predicate = std::function<bool(int ordinal, ITask* task)>;
 
-    RefusingQueue();
-    // Refuses the tasks with these ordinals, counted from 1 over all tasks offered, null ones excepted.
-    explicit RefusingQueue(std::set<int> ordinals);
     // Refuses where the predicate says so. It is called under the queue's lock and must not use the queue.
-    explicit RefusingQueue(Predicate refuses);
+    explicit RefusingQueue(Predicate refuses = [](int, ITask*) { return true; })
+        : mRefuses(std::move(refuses)) {}
 
 protected:
-    bool Accepts(int ordinal, ITask* task) override;
+    bool Accepts(int ordinal, ITask* task) override { return !mRefuses(ordinal, task); }
 
 private:
     Predicate mRefuses;

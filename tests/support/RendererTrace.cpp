@@ -139,19 +139,6 @@ std::string RendererTrace::GetActiveTarget() {
     return NameOf(recorder ? recorder->GetActive() : nullptr);
 }
 
-std::string RendererTrace::GetCurrentProgram() {
-    Access const trace;
-    Recorder const* const recorder = GetAttachedRecorder();
-    return trace->NameOf(recorder ? trace->FindProgram(*recorder->requested) : nullptr);
-}
-
-std::string RendererTrace::GetBoundTexture(int unit) {
-    Access const trace;
-    auto const& bound = trace->notes.boundTextures;
-    auto const found = bound.find(unit);
-    return trace->NameOf(found == bound.end() ? nullptr : found->second);
-}
-
 std::string RendererTrace::GetParameter(IShaderProgram const* program, std::string const& name) {
     Access const trace;
     auto const& values = trace->objects.at(program).values;

@@ -93,8 +93,6 @@ public:
 
     // Names as in the calls, "none" for nothing.
     static std::string GetActiveTarget();
-    static std::string GetCurrentProgram();
-    static std::string GetBoundTexture(int unit);
     // What a uniform was set to last: its numbers, separated by spaces; empty before.
     static std::string GetParameter(IShaderProgram const* program, std::string const& name);
 

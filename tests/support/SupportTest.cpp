@@ -1,89 +1,91 @@
 // The queues and the comparison of images that other tests believe in.
+#include "moka/renderer/IDepthStencilBuffer.h"
+#include "moka/renderer/IParameterBinding.h"
+#include "moka/renderer/IRenderTarget.h"
+#include "moka/renderer/IShaderProgram.h"
+#include "moka/renderer/ITextureObject.h"
+#include "moka/renderer/RendererFactory.h"
 #include "tests/support/ImageCompare.h"
 #include "tests/support/Queues.h"
-#include "tests/support/TestImages.h"
+#include "tests/support/RendererTrace.h"
 
 #include <gmock/gmock.h>
 
-#include <functional>
 #include <new>
-#include <set>
 #include <stdexcept>
-#include <vector>
+#include <thread>
 
 namespace Moka::Testing {
 namespace {
 
 using ::testing::ElementsAre;
 
-// Runs a function; says when it is freed.
-class FunctionTask final : public ITask {
+// Says when it runs, posting another one, and when it is freed.
+class NotingTask final : public ITask {
 public:
-    FunctionTask(int* freed, std::function<void()> function)
-        : mFreed(freed), mFunction(std::move(function)) {}
-    ~FunctionTask() override { ++*mFreed; }
-    void run() override { mFunction(); }
+    NotingTask(std::vector<std::string>& notes, HandPumpedQueue* queue) : mNotes(notes), mQueue(queue) {}
+    ~NotingTask() override { mNotes.emplace_back("freed"); }
+    void run() override {
+        mNotes.emplace_back("run");
+        if (!mQueue) throw std::runtime_error("task");
+        mQueue->Post(new (std::nothrow) NotingTask(mNotes, nullptr));
+        mQueue->WaitForTasks(); // a deadlock elsewhere
+    }
 
 private:
-    int* mFreed;
-    std::function<void()> mFunction;
+    std::vector<std::string>& mNotes;
+    HandPumpedQueue* mQueue;
 };
 
-class HandPumpedQueueTest : public ::testing::Test {
-protected:
-    ITask* MakeTask(std::function<void()> function = [] {}) {
-        return new (std::nothrow) FunctionTask(&mFreed, std::move(function));
+TEST(HandPumpedQueueTest, RunsInPostingOrderAndFreesEachOnceAlsoWhatThrowsOrNeverRuns) {
+    std::vector<std::string> notes;
+    {
+        HandPumpedQueue queue;
+        queue.SetAroundRun([&] { notes.emplace_back("begin"); }, [&] { notes.emplace_back("end"); });
+        queue.Post(new (std::nothrow) NotingTask(notes, &queue));
+        EXPECT_TRUE(queue.RunOne());
+        EXPECT_THROW(queue.WaitForTasks(), std::runtime_error);
+        EXPECT_THAT(notes, ElementsAre("begin", "run", "freed", "end", "begin", "run", "freed", "end"));
+        EXPECT_EQ(queue.GetWaitCount(), 1);
+        EXPECT_FALSE(queue.RunOne());
+        queue.Post(new (std::nothrow) NotingTask(notes, nullptr));
     }
-
-    int mFreed = 0;
-    std::vector<int> mOrder;
-};
-
-TEST_F(HandPumpedQueueTest, RunsInPostingOrderAndFreesEachOnceAlsoWhatThrows) {
-    int freedAfter = -1;
-    HandPumpedQueue queue;
-    queue.Post(MakeTask([&] {
-        mOrder.push_back(1);
-        queue.Post(MakeTask([&] { mOrder.push_back(3); }));
-        queue.WaitForTasks(); // a deadlock elsewhere
-        EXPECT_EQ(queue.GetPendingCount(), 2);
-    }));
-    queue.Post(nullptr);
-    queue.Post(MakeTask([&] { mOrder.push_back(2); }));
-    EXPECT_TRUE(queue.RunOne());
-    EXPECT_EQ(mFreed, 1);
-    queue.WaitForTasks();
-    EXPECT_THAT(mOrder, ElementsAre(1, 2, 3));
-    EXPECT_EQ(mFreed, 3);
-    EXPECT_EQ(queue.GetPostedCount(), 3);
-    EXPECT_EQ(queue.GetRunCount(), 3);
-    EXPECT_EQ(queue.GetNullCount(), 1);
-    EXPECT_EQ(queue.GetWaitCount(), 1);
-    EXPECT_FALSE(queue.RunOne());
-
-    queue.SetAroundRun([&] { mOrder.push_back(4); }, [&] { freedAfter = mFreed; });
-    queue.Post(MakeTask([] { throw std::runtime_error("task"); }));
-    EXPECT_THROW(queue.RunAll(), std::runtime_error);
-    EXPECT_EQ(mOrder.back(), 4);
-    EXPECT_EQ(freedAfter, 4);
+    EXPECT_EQ(notes.size(), 9u);
+    NotingTask refused(notes, nullptr);
+    EXPECT_FALSE(RefusingQueue().Post(&refused));
 }
 
-TEST_F(HandPumpedQueueTest, TasksNeverRunAreFreedWithTheQueueAndRefusedOnesStayWithTheCaller) {
-    ITask* const refused = MakeTask();
-    {
-        RefusingQueue queue(std::set<int>{2});
-        EXPECT_TRUE(queue.Post(MakeTask([&] { mOrder.push_back(1); })));
-        queue.Post(nullptr); // does not count as one of them
-        EXPECT_FALSE(queue.Post(refused));
-        EXPECT_TRUE(queue.Post(MakeTask([&] { mOrder.push_back(3); })));
-        EXPECT_EQ(queue.GetRefusedCount(), 1);
-        queue.RunOne();
-    }
-    EXPECT_THAT(mOrder, ElementsAre(1));
-    EXPECT_EQ(mFreed, 2);
-    EXPECT_FALSE(RefusingQueue().Post(refused));
-    delete refused;
-    EXPECT_EQ(mFreed, 3);
+// Were the trace silent, no test over it would be the wiser.
+TEST(RendererTraceTest, MisuseIsNoticed) {
+    RendererTrace::Reset();
+    RendererFactory::AttachContext();
+    ITextureObject* const texture = RendererFactory::CreateTextureObject(
+        TextureDescriptor(2, 2, 0, 2, 6, 1, false, nullptr), nullptr, 0, {});
+    IRenderTarget* const target = RendererFactory::CreateOffscreenRenderTarget(texture);
+    IDepthStencilBuffer* const buffer = RendererFactory::CreateDepthStencilBuffer(2, 2);
+    target->AttachDepthStencil(buffer);
+    buffer->Release();
+    target->ClearDepthStencil(true, 1, true, 0);
+    IShaderProgram* const program = RendererFactory::CreateShaderProgram("", "uniform bool uOn;", "Sample");
+    IParameterBinding* const parameter = program->GetParameter("uOn");
+    program->Release();
+    bool const on = true;
+    parameter->Set(&on);
+    delete parameter;
+    RendererTrace::DeclareNoRenderThread();
+    RendererFactory::Commit();
+    std::thread([&] { delete texture; }).join();
+    target->Release();
+    RendererFactory::DetachContext();
+    RendererFactory::Flush();
+    EXPECT_EQ(RendererTrace::CountLiveObjects(), 0);
+    EXPECT_THAT(RendererTrace::GetViolations(), ElementsAre("buffer 1 released while attached to target 1",
+                                                            "program 1 SetParameter after its release",
+                                                            "renderer Commit outside the render thread",
+                                                            "texture 1 Release outside the render thread",
+                                                            "target 1 Release outside the render thread",
+                                                            "renderer Flush without a context"));
+    RendererTrace::Reset();
 }
 
 TEST(ImageCompareTest, ReportsHowManyHowFarAndWhere) {

@@ -119,7 +119,6 @@ public:
         std::lock_guard const lock(mutex);
         if (!notes.keepsRecords) return;
         auto draw = MakeEvent<TracedDraw>(request.state, GetAttachedRecorder()->GetActive());
-        draw.graphics = NameOf(request.graphics);
         draw.primitive = request.primitive;
         std::ptrdiff_t const floats = std::ptrdiff_t{request.count} * request.floatsPerVertex;
         if (floats > 0) draw.vertices.assign(request.vertices, request.vertices + floats);
@@ -128,7 +127,6 @@ public:
         draw.count = request.count;
         draw.shader = request.state.GetProgram()->GetLabel();
         void const* const program = FindProgram(request.state);
-        draw.program = NameOf(program);
         if (program) draw.uniforms = objects[program].values;
         for (auto const& [unit, texture] : notes.boundTextures) draw.textures[unit] = NameOf(texture);
         notes.events.emplace_back(std::move(draw));
@@ -138,12 +136,7 @@ public:
         std::lock_guard const lock(mutex);
         if (!notes.keepsRecords) return;
         auto clear = MakeEvent<TracedClear>(request.state, static_cast<RenderTarget const*>(request.target));
-        clear.clearsColor = request.clearsColor;
         clear.color = request.color;
-        clear.clearsDepth = request.clearsDepth;
-        clear.depth = request.depth;
-        clear.clearsStencil = request.clearsStencil;
-        clear.stencil = request.stencil;
         notes.events.emplace_back(std::move(clear));
     }
 
@@ -232,7 +225,6 @@ private:
         Event event;
         event.state = ReadState(state);
         event.target = NameOf(target);
-        event.buffer = NameOf(target ? target->GetDepthStencil() : nullptr);
         return event;
     }
 };

@@ -29,16 +29,12 @@ struct TracedUniform {
 struct TracedDraw {
     PipelineState state;
     std::string target; // "target 1"; "none" when nothing is active
-    std::string buffer; // the depth-stencil buffer attached to it, or "none"
-
-    std::string graphics; // "graphics 1"
     PrimitiveType primitive = PrimitiveType::TriangleList;
     std::vector<float> vertices; // those drawn, first and count applied; empty when nothing was
     int floatsPerVertex = 0;
     int first = 0; // of the vertices handed over
     int count = 0; // that were there and were drawn
 
-    std::string program;                           // "program 1"
     std::string shader;                            // the name its creator gave it
     std::map<std::string, TracedUniform> uniforms; // those ever set, by name
     std::map<int, std::string> textures;           // "texture 1" by unit
@@ -47,14 +43,7 @@ struct TracedDraw {
 struct TracedClear {
     PipelineState state;
     std::string target; // what is cleared, whichever target is active
-    std::string buffer; // attached to it, or "none"
-
-    bool clearsColor = false;
     std::array<float, 4> color{};
-    bool clearsDepth = false;
-    float depth = 0;
-    bool clearsStencil = false;
-    int stencil = 0;
 };
 
 using TracedEvent = std::variant<TracedDraw, TracedClear>;

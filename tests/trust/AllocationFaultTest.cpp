@@ -16,25 +16,30 @@ namespace {
 
 class FaultSweep : public TrustFixture {
 protected:
-    // Runs the scenario with the k-th allocation failing, for each k that there is and one more.
-    template <class Check>
-    void Sweep(Faults::Kind kind, Check const& check) {
+    // Runs the scenario with the k-th failing, or all from the k-th on, for each k that there is and one more.
+    template <class Run, class Check>
+    void Sweep(int count, Run const& run, Check const& check) {
         std::vector<std::string> const undisturbed = TakeFrame();
-        Faults::Arm(kind, 0, false);
-        RunScenario();
-        int const count = Faults::Disarm();
         for (bool const all : {false, true})
             for (int k = 1; k <= count + 1 && !HasFatalFailure(); ++k) {
                 SCOPED_TRACE((all ? "all from " : "only ") + std::to_string(k) + " of " +
                              std::to_string(count));
-                Faults::Arm(kind, k, all);
-                RunScenario();
-                Faults::Disarm();
+                run(k, all);
                 check(k <= count);
                 ASSERT_EQ(TakeFrame(), undisturbed);
             }
         RecordProperty("faults", 2 * (count + 1));
         EXPECT_GT(count, 0);
+    }
+    template <class Check>
+    void SweepAllocations(Faults::Kind kind, Check const& check) {
+        auto const run = [&](int k, bool all) {
+            Faults::Arm(kind, k, all);
+            RunScenario();
+            return Faults::Disarm();
+        };
+        RunScenario();
+        Sweep(run(0, false), run, check);
     }
 };
 
@@ -43,7 +48,7 @@ class AllocationFaults : public FaultSweep {};
 TEST_P(AllocationFaults, AnObjectThatCannotBeMadeLeavesNothingBehind) {
     int const alive = RendererTrace::CountLiveObjects();
     auto const objects = Faults::CountLive(Faults::Kind::Objects);
-    Sweep(Faults::Kind::Objects, [&](bool) {
+    SweepAllocations(Faults::Kind::Objects, [&](bool) {
         EXPECT_EQ(RendererTrace::CountLiveObjects(), alive);
         EXPECT_EQ(Faults::CountLive(Faults::Kind::Objects), objects);
         // A class that memory ran out for has no shader from then on, by design: its drawables draw nothing
@@ -58,11 +63,33 @@ TEST_P(AllocationFaults, ACallWithoutMemoryForItsCopiesLeavesNothingBehind) {
     int const alive = RendererTrace::CountLiveObjects();
     auto const objects = Faults::CountLive(Faults::Kind::Objects);
     auto const tasks = Faults::CountLive(Faults::Kind::Tasks);
-    Sweep(Faults::Kind::Throwing, [&](bool) {
+    SweepAllocations(Faults::Kind::Throwing, [&](bool) {
         EXPECT_EQ(RendererTrace::CountLiveObjects(), alive);
         EXPECT_EQ(Faults::CountLive(Faults::Kind::Objects), objects);
         EXPECT_EQ(Faults::CountLive(Faults::Kind::Tasks), tasks);
     });
+}
+
+// Of renderer objects: all but programs, which FailCreation does not count.
+TEST_P(AllocationFaults, AnObjectThatTheRendererRefusesLeavesNothingBehindAndTheNextFrameRight) {
+    RendererTrace::TakeCalls();
+    RunScenario();
+    int count = 0;
+    for (TracedCall const& call : RendererTrace::GetCalls())
+        if (call.operation == "Create" && call.object.rfind("program", 0) != 0) ++count;
+    int const alive = RendererTrace::CountLiveObjects();
+    auto const objects = Faults::CountLive(Faults::Kind::Objects);
+    Sweep(
+        count,
+        [&](int k, bool all) {
+            for (int n = k; n <= (all ? count + 1 : k); ++n) RendererTrace::FailCreation(n);
+            RunScenario();
+            RendererTrace::StopFailing();
+        },
+        [&](bool) {
+            EXPECT_EQ(RendererTrace::CountLiveObjects(), alive);
+            EXPECT_EQ(Faults::CountLive(Faults::Kind::Objects), objects);
+        });
 }
 
 class RequestFaults : public FaultSweep {};
@@ -72,7 +99,7 @@ class RequestFaults : public FaultSweep {};
 // that nothing else stays.
 TEST_P(RequestFaults, ARequestThatCannotBeMadeIsARefusedOne) {
     auto const tasks = Faults::CountLive(Faults::Kind::Tasks);
-    Sweep(Faults::Kind::Tasks, [&](bool failed) {
+    SweepAllocations(Faults::Kind::Tasks, [&](bool failed) {
         EXPECT_EQ(Faults::CountLive(Faults::Kind::Tasks), tasks);
         int const live = RendererTrace::CountLiveObjects();
         auto const objects = Faults::CountLive(Faults::Kind::Objects);

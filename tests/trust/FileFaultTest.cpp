@@ -6,11 +6,9 @@
 #include "tests/support/TestFiles.h"
 
 #include <cerrno>
-#include <csignal>
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 #include <string>
-#include <sys/resource.h>
 #include <vector>
 
 namespace Moka::Testing {
@@ -33,26 +31,6 @@ protected:
         action();
         return FileFaults::Disarm();
     }
-
-    // No file of the process grows beyond so many bytes while it lives: the kernel's own refusal.
-    class SizeLimit {
-    public:
-        explicit SizeLimit(rlim_t bytes) : mOldHandler(std::signal(SIGXFSZ, SIG_IGN)) {
-            getrlimit(RLIMIT_FSIZE, &mOld);
-            rlimit const limit{bytes, mOld.rlim_max};
-            setrlimit(RLIMIT_FSIZE, &limit);
-        }
-        ~SizeLimit() {
-            setrlimit(RLIMIT_FSIZE, &mOld);
-            std::signal(SIGXFSZ, mOldHandler);
-        }
-        SizeLimit(SizeLimit const&) = delete;
-        SizeLimit& operator=(SizeLimit const&) = delete;
-
-    private:
-        rlimit mOld{};
-        void (*mOldHandler)(int);
-    };
 
     // Large enough for several blocks of any codec.
     Picture const mOld = MakeChecker(90, 70, 5, {255, 0, 0, 255}, {0, 0, 255, 255});
@@ -91,26 +69,6 @@ TEST_P(FileFault, ASaveShowsTheOldFileOrTheWholeNewOne) {
             }
     RecordProperty("faults", failures);
     EXPECT_GE(failures, 5 * 6);
-}
-
-TEST_P(FileFault, AFileThatTheKernelWillNotLetGrowLeavesTheOldOne) {
-    ASSERT_TRUE(Save(mNew));
-    auto const size = static_cast<rlim_t>(ReadFile().size());
-    ASSERT_TRUE(Save(mOld));
-    std::string const oldBytes = ReadFile();
-    for (rlim_t const bytes : {rlim_t{0}, rlim_t{1}, size / 2, size - 1}) {
-        SCOPED_TRACE(std::to_string(bytes) + " of " + std::to_string(size));
-        mLog.Clear();
-        bool isSaved = false;
-        {
-            SizeLimit const limit(bytes);
-            isSaved = Save(mNew);
-        }
-        EXPECT_FALSE(isSaved);
-        EXPECT_EQ(ReadFile(), oldBytes);
-        EXPECT_EQ(mLog.Count(ANDROID_LOG_ERROR), 1);
-        EXPECT_TRUE(IsAlone());
-    }
 }
 
 TEST_P(FileFault, ALoadGivesTheWholePictureOrNothing) {

@@ -16,8 +16,8 @@
 namespace Moka::Testing {
 namespace {
 
-constexpr std::int64_t kPosts = 300000;
-constexpr std::int64_t kPostsBetweenLooks = 50000;
+constexpr std::int64_t kPosts = 60000;
+constexpr std::int64_t kPostsBetweenLooks = 20000;
 
 // Thread: one, which stands for both sides.
 class UnreliableQueue final : public IGLMsgQueue {

@@ -5,6 +5,7 @@
 #include <atomic>
 #include <cstdarg>
 #include <cstdio>
+#include <cstring>
 #include <mutex>
 #include <string>
 #include <utility>
@@ -26,6 +27,7 @@ SinkSlot& Slot() {
 }
 
 std::atomic<int> lowestPriority{ANDROID_LOG_INFO};
+std::atomic<bool> hasSink{false};
 
 char LevelOf(int priority) {
     switch (priority) {
@@ -45,12 +47,20 @@ char LevelOf(int priority) {
 }
 
 std::string Format(char const* format, va_list arguments) {
+    // Long enough for most lines.
+    char brief[256];
     va_list again;
     va_copy(again, arguments);
     // NOLINTBEGIN(clang-analyzer-valist.Uninitialized): both are, by the caller and by va_copy
-    int const length = std::vsnprintf(nullptr, 0, format, arguments);
-    std::string text(length > 0 ? static_cast<std::size_t>(length) : 0, '\0');
-    if (length > 0) std::vsnprintf(text.data(), text.size() + 1, format, again);
+    int const length = std::vsnprintf(brief, sizeof brief, format, arguments);
+    std::size_t const size = length > 0 ? static_cast<std::size_t>(length) : 0;
+    std::string text;
+    if (size < sizeof brief) {
+        text.assign(brief, size);
+    } else {
+        text.resize(size);
+        std::vsnprintf(text.data(), size + 1, format, again);
+    }
     // NOLINTEND(clang-analyzer-valist.Uninitialized)
     va_end(again);
     return text;
@@ -72,19 +82,21 @@ bool GiveToSink(LogLine const& line) {
     return taken;
 }
 
-int WriteToStderr(LogLine const& line) {
+int WriteToStderr(int priority, char const* tag, std::string const& text) {
     std::string whole;
-    whole.reserve(line.tag.size() + line.text.size() + 5);
-    whole.append(1, LevelOf(line.priority)).append(1, ' ').append(line.tag).append(": ");
-    whole.append(line.text).append(1, '\n');
+    whole.reserve(std::strlen(tag) + text.size() + 5);
+    whole.append(1, LevelOf(priority)).append(1, ' ').append(tag).append(": ");
+    whole.append(text).append(1, '\n');
     // One call, since stderr is not buffered: what is formatted into it can reach the file in pieces.
     return static_cast<int>(std::fwrite(whole.data(), 1, whole.size(), stderr));
 }
 
 int Print(int priority, char const* tag, char const* format, va_list arguments) {
+    bool const isSeen = priority >= lowestPriority;
+    if (!hasSink) return isSeen ? WriteToStderr(priority, tag, Format(format, arguments)) : 0;
     LogLine const line{priority, tag, format, Format(format, arguments)};
     if (GiveToSink(line)) return static_cast<int>(line.text.size());
-    return priority < lowestPriority ? 0 : WriteToStderr(line);
+    return isSeen ? WriteToStderr(priority, tag, line.text) : 0;
 }
 
 } // namespace
@@ -93,6 +105,7 @@ LogSink SetLogSink(LogSink sink) {
     SinkSlot& slot = Slot();
     std::lock_guard<std::recursive_mutex> lock(slot.mutex);
     std::swap(slot.sink, sink);
+    hasSink = static_cast<bool>(slot.sink);
     return sink;
 }
 

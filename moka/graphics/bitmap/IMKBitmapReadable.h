@@ -13,6 +13,8 @@ public:
 
     virtual void ActivateTextureRT(int unit, bool release) = 0;
 
+    // A value that is no filter or wrap is refused with a log line; the former one stays. docs/canvas.md tells
+    // what TextureFilterMipmapped is for, and when its levels are made.
     // The forms without a kind set both filters, and both wrap directions.
     virtual void SetTextureFilter(TextureParamFilteringValue value) = 0;
     virtual void SetTextureFilter(TextureParamFiltering kind, TextureParamFilteringValue value) = 0;

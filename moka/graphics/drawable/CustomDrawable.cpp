@@ -66,7 +66,7 @@ Shader& CustomDrawable<Shader>::Begin(void const* vertices, int count, IMKBitmap
                                       MKPaint const& paint) {
     mObjects->graphics->SetVertices(0, vertices, count);
     mObjects->state.ApplyBlend(paint.GetXFermode());
-    MKGraphicsUtil::SetTileModeRT(tiled, paint);
+    if (tiled) MKGraphicsUtil::SetTileModeRT(tiled, paint);
     mObjects->state.ApplyDepthStencil();
     mObjects->shader->program->MakeCurrent();
     return *mObjects->shader;
@@ -77,9 +77,15 @@ void CustomDrawable<Shader>::DrawVertices() {
     DrawAll(*mObjects->graphics);
 }
 
+template <class Shader>
+IGraphicsObject& CustomDrawable<Shader>::GetGraphics() {
+    return *mObjects->graphics;
+}
+
 template class CustomDrawable<MKBlenderBitmapsShader>;
 template class CustomDrawable<MKGaussianBlurShader>;
 template class CustomDrawable<MKNonPremultipliedColorShader>;
+template class CustomDrawable<MKStrokeShader>;
 template class CustomDrawable<MKTextMaskBitmapShader>;
 
 } // namespace Moka::detail

@@ -43,6 +43,8 @@ protected:
     // with DrawVertices.
     Shader& Begin(void const* vertices, int count, IMKBitmapReadable* tiled, MKPaint const& paint);
     void DrawVertices();
+    // For drawables that draw several times with the same uniforms.
+    IGraphicsObject& GetGraphics();
 
     RefPtr<IMKBitmap> mBitmap;
     RefPtr<IMKBitmap> mSecondBitmap; // of those that have two

@@ -1,4 +1,4 @@
-// Shaders.h: the twelve programs that the library draws with. CMakeLists.txt here says which GLSL files each
+// Shaders.h: the thirteen programs that the library draws with. CMakeLists.txt here says which GLSL files each
 // is made of; the files say what a vertex is. Every vertex stage maps pixels of the canvas by its projection.
 // Colours come in as the paint has them and leave premultiplied. The flags are ints: 1 is on.
 #pragma once
@@ -101,5 +101,15 @@ MOKA_SHADER_CLASS(MKNonPremultipliedColorShader, MOKA_NON_PREMULTIPLIED_COLOR_UN
     U(Bool, isHorizontal)                                                                                    \
     U(Float, blurAmount)
 MOKA_SHADER_CLASS(MKGaussianBlurShader, MOKA_GAUSSIAN_BLUR_UNIFORMS)
+
+// A stroke under the maximum of its segments' coverages. The uToCanvas rows map the target's pixels to the
+// canvas's.
+#define MOKA_STROKE_UNIFORMS(U)                                                                              \
+    MOKA_COLOR_UNIFORMS(U)                                                                                   \
+    U(Vector4, uToCanvasX)                                                                                   \
+    U(Vector4, uToCanvasY)                                                                                   \
+    U(Vector4, uToCanvasW)                                                                                   \
+    U(Float, uMargin)
+MOKA_SHADER_CLASS(MKStrokeShader, MOKA_STROKE_UNIFORMS)
 
 } // namespace Moka

@@ -45,23 +45,27 @@ template <class T>
 RectF MapCorners(T const* m, T left, T top, T right, T bottom) {
     T const xs[] = {left, right, right, left};
     T const ys[] = {top, bottom, top, bottom};
-    T boxLeft = 0, boxTop = 0, boxRight = 0, boxBottom = 0;
-    for (int i = 0; i < 4; ++i) {
-        T const w = m[2] * xs[i] + m[5] * ys[i] + m[8];
-        T x = m[0] * xs[i] + m[3] * ys[i] + m[6];
-        T y = m[1] * xs[i] + m[4] * ys[i] + m[7];
-        // Dividing by 1 changes nothing, and takes time.
-        if (w != 1) {
-            x /= w;
-            y /= w;
-        }
-        // Only a first corner that is not a number leaves its trace.
-        if (i == 0 || x < boxLeft) boxLeft = x;
-        if (i == 0 || x > boxRight) boxRight = x;
-        if (i == 0 || y < boxTop) boxTop = y;
-        if (i == 0 || y > boxBottom) boxBottom = y;
+    T mappedX[4];
+    T mappedY[4];
+    T w[4];
+    // Four at once.
+    for (int i = 0; i < 4; ++i) w[i] = m[2] * xs[i] + m[5] * ys[i] + m[8];
+    for (int i = 0; i < 4; ++i) mappedX[i] = m[0] * xs[i] + m[3] * ys[i] + m[6];
+    for (int i = 0; i < 4; ++i) mappedY[i] = m[1] * xs[i] + m[4] * ys[i] + m[7];
+    // Dividing by 1 changes nothing, and takes time.
+    if (w[0] != 1 || w[1] != 1 || w[2] != 1 || w[3] != 1) {
+        for (int i = 0; i < 4; ++i) mappedX[i] /= w[i];
+        for (int i = 0; i < 4; ++i) mappedY[i] /= w[i];
     }
-    return {boxLeft, boxTop, boxRight, boxBottom};
+    // Only a first corner that is not a number leaves its trace.
+    RectF box(mappedX[0], mappedY[0], mappedX[0], mappedY[0]);
+    for (int i = 1; i < 4; ++i) {
+        box.left = mappedX[i] < box.left ? mappedX[i] : box.left;
+        box.right = mappedX[i] > box.right ? mappedX[i] : box.right;
+        box.top = mappedY[i] < box.top ? mappedY[i] : box.top;
+        box.bottom = mappedY[i] > box.bottom ? mappedY[i] : box.bottom;
+    }
+    return box;
 }
 
 } // namespace

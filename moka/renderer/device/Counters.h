@@ -59,6 +59,7 @@ struct Counters {
 
     Counter clears;
     Counter copies;
+    Counter mipmapUpdates;
     Counter bytesUploaded;
     Counter vertexBytes;
     Counter bytesReadBack;
@@ -97,6 +98,7 @@ struct Counters {
         result.queries = queries;
         result.clears = clears;
         result.copies = copies;
+        result.mipmapUpdates = mipmapUpdates;
         result.bytesUploaded = bytesUploaded;
         result.vertexBytes = vertexBytes;
         result.bytesReadBack = bytesReadBack;

@@ -53,7 +53,7 @@ public:
 
     virtual DeviceCaps GetCaps() const = 0;
 
-    // Undefined contents, linear filters and clamp to edge for external GL that samples it.
+    // Undefined contents, one level, linear filters and clamp to edge for external GL that samples it.
     virtual DeviceName CreateTexture(int width, int height) = 0;
     virtual void DeleteTexture(DeviceName texture) = 0;
     // pixels addresses the requested block's first pixel; stride is the distance of its rows, any number of

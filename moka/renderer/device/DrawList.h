@@ -70,8 +70,13 @@ struct TextureDraw {
     TargetRef to;
 };
 
-using Command =
-    std::variant<Run, ColorClear, DepthStencilClear, TextureClear, Discard, TargetCopy, TextureDraw>;
+// Makes the levels of a texture from its texels. Changes no state that a draw depends on.
+struct MipmapUpdate {
+    DeviceName texture;
+};
+
+using Command = std::variant<Run, ColorClear, DepthStencilClear, TextureClear, Discard, TargetCopy,
+                             TextureDraw, MipmapUpdate>;
 
 struct DrawList {
     std::vector<Command> commands;

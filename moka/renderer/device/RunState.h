@@ -41,7 +41,7 @@ struct ScissorState {
 
 struct Sampling {
     TextureParamFilteringValue minFilter = TextureFilterLinear;
-    TextureParamFilteringValue magFilter = TextureFilterLinear;
+    TextureParamFilteringValue magFilter = TextureFilterLinear; // never mipmapped
     TextureParamWrappingValue wrapS = TextureWrapClampToEdge;
     TextureParamWrappingValue wrapT = TextureWrapClampToEdge;
 

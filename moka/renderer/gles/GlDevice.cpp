@@ -12,6 +12,8 @@
 namespace Moka::detail {
 namespace {
 
+constexpr GLint kMostLevels = 1000; // GL's default
+
 std::string GetText(GLenum name) {
     auto const* const text = reinterpret_cast<char const*>(Gl::GetString(name));
     return text ? text : "";
@@ -63,12 +65,14 @@ DeviceName GlDevice::CreateTexture(int width, int height) {
     GLuint name = 0;
     Gl::GenTextures(1, &name);
     GlEditTexture const edit(state, name);
-    Gl::TexStorage2D(GL_TEXTURE_2D, 1, kGlInternalFormat, width, height);
-    // Samplers overrule these; they are for external GL that samples the texture without one.
+    // Samplers overrule these; they are for external GL that samples the texture without one. They go before the
+    // storage: drivers reserve room for all levels when the filter or the last level lets them expect some.
+    Gl::TexParameteri(GL_TEXTURE_2D, GL_TEXTURE_MAX_LEVEL, 0);
     Gl::TexParameteri(GL_TEXTURE_2D, GL_TEXTURE_MIN_FILTER, GL_LINEAR);
     Gl::TexParameteri(GL_TEXTURE_2D, GL_TEXTURE_MAG_FILTER, GL_LINEAR);
     Gl::TexParameteri(GL_TEXTURE_2D, GL_TEXTURE_WRAP_S, GL_CLAMP_TO_EDGE);
     Gl::TexParameteri(GL_TEXTURE_2D, GL_TEXTURE_WRAP_T, GL_CLAMP_TO_EDGE);
+    ReservePixels(state, width, height);
     if (debug.Check("making a texture")) return name;
     DeleteTexture(name);
     return 0;
@@ -83,6 +87,16 @@ void GlDevice::Upload(DeviceName texture, PixelBlock const& block, void const* p
     GlEditTexture const edit(state, texture);
     UploadPixels(state, block, pixels, stride);
     debug.Check("uploading pixels");
+}
+
+void GlDevice::UpdateMipmap(DeviceName texture) {
+    GlEditTexture const edit(state, texture);
+    Gl::TexParameteri(GL_TEXTURE_2D, GL_TEXTURE_MAX_LEVEL, kMostLevels);
+    Gl::GenerateMipmap(GL_TEXTURE_2D);
+    ++counters.mipmapUpdates;
+    if (debug.Check("making the levels of a texture")) return;
+    // Without all of its levels GL samples it as black.
+    Gl::TexParameteri(GL_TEXTURE_2D, GL_TEXTURE_MAX_LEVEL, 0);
 }
 
 void GlDevice::ReadPixels(TargetRef const& target, PixelBlock const& block, void* pixels, int rowLength) {
@@ -137,7 +151,10 @@ void GlDevice::Commit(StateCommit const& commit) {
     if (commit.scissorTest) state.SetScissorTest(*commit.scissorTest);
     if (commit.scissorRect) state.SetScissorRect(ToGlBox(*commit.scissorRect));
     if (commit.blend) state.SetBlend(*commit.blend);
-    if (commit.depthStencil) state.SetDepthStencil(*commit.depthStencil);
+    if (commit.depthStencil) {
+        host.SaveObstacles();
+        state.SetDepthStencil(*commit.depthStencil);
+    }
     if (commit.program != 0) programs.Apply(commit.program, commit.values);
     for (std::size_t i = 0; i < commit.textureCount; ++i) BindTexture(commit.textures[i]);
 }

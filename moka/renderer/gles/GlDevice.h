@@ -46,6 +46,7 @@ public:
     void DeleteSamplers() override;
 
     void BindTexture(TextureRef const& texture);
+    void UpdateMipmap(DeviceName texture);
 
     Counters& counters;
     GlWorkarounds const workarounds;

@@ -16,11 +16,11 @@
     X(DepthFunc) X(DepthMask) X(DetachShader) X(Disable) X(DrawArrays) X(Enable) \
     X(EnableVertexAttribArray) X(Finish) X(FramebufferRenderbuffer) X(FramebufferTexture2D) \
     X(GenBuffers) X(GenFramebuffers) X(GenRenderbuffers) X(GenSamplers) X(GenTextures) \
-    X(GenVertexArrays) X(GetActiveUniform) X(GetBooleanv) X(GetIntegerv) X(GetProgramInfoLog) \
+    X(GenVertexArrays) X(GenerateMipmap) X(GetActiveUniform) X(GetBooleanv) X(GetIntegerv) X(GetProgramInfoLog) \
     X(GetProgramiv) X(GetShaderInfoLog) X(GetShaderiv) X(GetString) X(GetStringi) X(GetUniformBlockIndex) X(GetUniformLocation) \
     X(InvalidateFramebuffer) X(IsEnabled) X(LinkProgram) X(PixelStorei) X(ReadPixels) \
     X(RenderbufferStorage) X(SamplerParameteri) X(Scissor) X(ShaderSource) X(StencilFunc) X(StencilMask) \
-    X(StencilMaskSeparate) X(StencilOp) X(TexParameteri) X(TexStorage2D) X(TexSubImage2D) X(Uniform1fv) X(UniformBlockBinding) \
+    X(StencilMaskSeparate) X(StencilOp) X(TexImage2D) X(TexParameteri) X(TexSubImage2D) X(Uniform1fv) X(UniformBlockBinding) \
     X(Uniform1iv) X(Uniform2fv) X(Uniform4fv) X(UniformMatrix4fv) X(UseProgram) X(VertexAttribIPointer) X(VertexAttribPointer) \
     X(Viewport)
 // clang-format on

@@ -31,9 +31,11 @@ void GlHostState::BindTarget(GLuint frameBuffer, GLsizei width, GLsizei height) 
     Bind({frameBuffer, frameBuffer});
     Save(mState.viewport, mViewport);
     if (width > 0) mState.viewport.Set({0, 0, width, height});
-    Save(mState.obstacles, mObstacles);
+    SaveObstacles();
     mState.obstacles.Set(0);
 }
+
+void GlHostState::SaveObstacles() { Save(mState.obstacles, mObstacles); }
 
 void GlHostState::SaveVertexInput() {
     Save(mState.vertexArray, mVertexArray);

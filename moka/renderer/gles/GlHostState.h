@@ -19,6 +19,8 @@ public:
     void BindRead(GLuint frameBuffer);
     // With a viewport of this size (none is set for a width of 0), and nothing in the way of drawing.
     void BindTarget(GLuint frameBuffer, GLsizei width, GLsizei height);
+    // The tests that obstruct drawing may be changed afterwards.
+    void SaveObstacles();
     // Vertex array and buffer may be changed afterwards.
     void SaveVertexInput();
     // The general binding of uniform buffers may be changed afterwards.

@@ -30,6 +30,12 @@ void Upload(GLint x, GLint y, GLsizei width, GLsizei height, void const* pixels)
 
 } // namespace
 
+void ReservePixels(GlState& state, GLsizei width, GLsizei height) {
+    GlPixelStoreScope const store(state.unpack, 0); // no buffer of the host's to read from
+    Gl::TexImage2D(GL_TEXTURE_2D, 0, static_cast<GLint>(kGlInternalFormat), width, height, 0, kGlFormat,
+                   kGlType, nullptr);
+}
+
 void UploadPixels(GlState& state, PixelBlock const& block, void const* pixels, std::int64_t stride) {
     auto const* row = static_cast<unsigned char const*>(pixels) + block.skippedRows * stride +
                       block.skippedPixels * kBytesPerPixel;

@@ -7,6 +7,10 @@
 
 namespace Moka::detail {
 
+// Storage for the level 0 of the texture bound by GlEditTexture. Not immutable, so that levels may be added:
+// few textures have any.
+void ReservePixels(GlState& state, GLsizei width, GLsizei height);
+
 // To the texture bound by GlEditTexture. pixels addresses the requested block's first pixel; stride is the
 // distance of its rows in bytes, any number.
 void UploadPixels(GlState& state, PixelBlock const& block, void const* pixels, std::int64_t stride);

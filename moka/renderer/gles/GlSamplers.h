@@ -27,7 +27,7 @@ private:
     };
 
     GlState& mState;
-    std::vector<Entry> mEntries; // few: filters and wraps have 36 combinations
+    std::vector<Entry> mEntries; // few: filters and wraps have 54 combinations
 };
 
 } // namespace Moka::detail

@@ -166,6 +166,11 @@ void GlSubmitter::Execute(TextureDraw const& draw) {
     ++mDevice.counters.copies;
 }
 
+void GlSubmitter::Execute(MipmapUpdate const& update) {
+    BeginCopy();
+    mDevice.UpdateMipmap(update.texture);
+}
+
 // Of all state, only the scissor test holds for a blit.
 void GlSubmitter::Blit(TargetRef const& from, TargetRef const& to, int width, int height) {
     mDevice.host.Bind({to.frameBuffer, from.frameBuffer});

@@ -27,6 +27,7 @@ private:
     void Execute(Discard const& discard);
     void Execute(TargetCopy const& copy);
     void Execute(TextureDraw const& draw);
+    void Execute(MipmapUpdate const& update);
 
     void Apply(RunState const& state);
     void BindForClear(TargetRef const& target);

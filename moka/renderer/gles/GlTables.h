@@ -16,6 +16,8 @@ constexpr GLenum ToGlFilter(TextureParamFilteringValue value) {
         return GL_NEAREST;
     case TextureFilterLinear:
         return GL_LINEAR;
+    case TextureFilterMipmapped:
+        return GL_LINEAR_MIPMAP_LINEAR;
     }
     return GL_NONE;
 }

@@ -175,6 +175,9 @@ void NullDevice::Execute(TextureDraw const& draw) {
     Copy(draw.from, draw.to, draw.from.width, draw.from.height);
 }
 
+// Nothing is sampled.
+void NullDevice::Execute(MipmapUpdate const&) { ++mCounters.mipmapUpdates; }
+
 void NullDevice::Copy(TargetRef const& from, TargetRef const& to, int width, int height) {
     NullImage& source = GetImage(from);
     NullImage& destination = GetImage(to);

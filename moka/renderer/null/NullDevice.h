@@ -63,6 +63,7 @@ private:
     void Execute(DepthStencilClear const& clear);
     void Execute(TargetCopy const& copy);
     void Execute(TextureDraw const& draw);
+    void Execute(MipmapUpdate const& update);
     void Copy(TargetRef const& from, TargetRef const& to, int width, int height);
 
     Counters& mCounters;

@@ -48,8 +48,9 @@ void DrawListBuilder::AddDraw(RunState const& state, bool isKnownSame, ProgramSt
     Record const record{AddValues(program), static_cast<int>(vertices.offset / vertices.stride) + draw.first,
                         draw.count};
     OpenRun* const run = FindRun(stateIndex, draw.bounds);
-    if (run && MayJoin(*run, program, record)) {
-        Join(*run, program, record, draw.bounds);
+    Continuation how;
+    if (run && Continues(*run, program.GetLayout(), record, how)) {
+        Join(*run, record, draw.bounds, how);
     } else {
         OpenNewRun(stateIndex, record, draw.bounds, vertices.stride);
     }
@@ -96,15 +97,11 @@ std::size_t DrawListBuilder::AddState(RunState const& state, bool isKnownSame) {
 
 std::size_t DrawListBuilder::AddValues(ProgramState& program) {
     ProgramState::Listed& listed = program.listed;
+    if (listed.list == mNumber && !listed.isStale) return listed.offset;
     std::vector<unsigned char> const& values = program.GetValues();
-    bool const isHere = listed.list == mNumber;
-    bool const isSame = isHere && (!listed.isStale || std::memcmp(&mList.uniforms[listed.offset],
-                                                                  values.data(), values.size()) == 0);
-    if (!isSame) {
-        listed.offset = mList.uniforms.size();
-        mList.uniforms.insert(mList.uniforms.end(), values.begin(), values.end());
-        listed.list = mNumber;
-    }
+    listed.offset = mList.uniforms.size();
+    mList.uniforms.insert(mList.uniforms.end(), values.begin(), values.end());
+    listed.list = mNumber;
     listed.isStale = false;
     return listed.offset;
 }
@@ -132,43 +129,36 @@ bool DrawListBuilder::MayTouch(OpenRun& run, DrawBounds const& bounds) {
     return run.bounds.MayTouch(bounds);
 }
 
-bool DrawListBuilder::MayJoin(OpenRun const& run, ProgramState const& program, Record const& record) const {
+bool DrawListBuilder::Continues(OpenRun const& run, ProgramLayout const& layout, Record const& record,
+                                Continuation& how) const {
     Record const& last = mDraws[run.tail].record;
-    bool const isNext = last.first + last.count == record.first;
-    if (last.values == record.values)
-        return isNext || (mMerges && run.vertices + record.count <= kMostGathered);
-    if (!mMerges) return false;
-    if (!isNext && run.vertices + record.count > kMostGathered) return false;
-    ProgramLayout const& layout = program.GetLayout();
+    how.isNext = last.first + last.count == record.first;
+    how.isSame = last.values == record.values;
+    if (!how.isNext && (!mMerges || run.vertices + record.count > kMostGathered)) return false;
+    if (how.isSame) return true;
+    // Run::varying has so many bits.
     std::size_t const integers = layout.integersEnd - layout.integersBegin;
+    if (!mMerges || integers > 32 * sizeof(std::int32_t)) return false;
     if (integers == 0) return true;
-    // The bits of Run::varying.
-    if (integers > 32 * sizeof(std::int32_t)) return false;
-    if (run.varying != 0 || run.draws < kLongRun) return true;
-    return std::memcmp(&mList.uniforms[last.values] + layout.integersBegin,
-                       &mList.uniforms[record.values] + layout.integersBegin, integers) == 0;
+    unsigned char const* const values = mList.uniforms.data();
+    how.varying = FindVarying(values + last.values, values + record.values, layout);
+    return how.varying == 0 || run.varying != 0 || run.draws < kLongRun;
 }
 
-void DrawListBuilder::Join(OpenRun& run, ProgramState const& program, Record const& record,
-                           DrawBounds const& bounds) {
-    Record& last = mDraws[run.tail].record;
-    bool const isNext = last.first + last.count == record.first;
-    bool const isSame = last.values == record.values;
-    if (isNext && isSame) {
-        last.count += record.count;
-        mDraws[run.tail].bounds = Enclose(mDraws[run.tail].bounds, bounds);
+void DrawListBuilder::Join(OpenRun& run, Record const& record, DrawBounds const& bounds,
+                           Continuation const& how) {
+    if (how.isNext && how.isSame) {
+        Draw& last = mDraws[run.tail];
+        last.record.count += record.count;
+        last.bounds = Enclose(last.bounds, bounds);
         run.unbounded = std::min(run.unbounded, run.tail);
     } else {
         std::uint32_t const index = AddRecord(record, bounds);
         if (run.unbounded == kEnd) run.unbounded = index;
-        if (!isSame) {
-            unsigned char const* const values = mList.uniforms.data();
-            Record const& before = mDraws[run.tail].record;
-            run.varying |= FindVarying(values + before.values, values + record.values, program.GetLayout());
-        }
         mDraws[run.tail].next = index;
         run.tail = index;
-        run.isContiguous = run.isContiguous && isNext;
+        run.varying |= how.varying;
+        run.isContiguous = run.isContiguous && how.isNext;
     }
     ++run.draws;
     run.vertices += record.count;

@@ -18,6 +18,7 @@ namespace Moka::detail {
 
 struct Counters;
 class ProgramState;
+struct ProgramLayout;
 
 // Vertices that were handed over and lie in a list, or lay in it until it was flushed.
 struct ListVertices {
@@ -133,13 +134,22 @@ private:
         std::uint32_t unbounded; // the first draw that is not in bounds yet, or kEnd
     };
 
+    // How a record follows the last one of a run.
+    struct Continuation {
+        bool isNext = false;       // its vertices lie behind the last one's
+        bool isSame = false;       // it has the same values
+        std::uint32_t varying = 0; // a bit for each integer that differs
+    };
+
     bool IsUndrawnEnd(ListVertices const& vertices) const;
     std::size_t AddState(RunState const& state, bool isKnownSame);
     std::size_t AddValues(ProgramState& program);
     OpenRun* FindRun(std::size_t state, DrawBounds const& bounds);
     bool MayTouch(OpenRun& run, DrawBounds const& bounds);
-    bool MayJoin(OpenRun const& run, ProgramState const& program, Record const& record) const;
-    void Join(OpenRun& run, ProgramState const& program, Record const& record, DrawBounds const& bounds);
+    // False: the record needs a run of its own.
+    bool Continues(OpenRun const& run, ProgramLayout const& layout, Record const& record,
+                   Continuation& how) const;
+    void Join(OpenRun& run, Record const& record, DrawBounds const& bounds, Continuation const& how);
     void OpenNewRun(std::size_t state, Record const& record, DrawBounds const& bounds, std::size_t stride);
     std::uint32_t AddRecord(Record const& record, DrawBounds const& bounds);
     RunEnd GetEndBefore(std::size_t state) const;
@@ -152,6 +162,7 @@ private:
     void UseTextures(DepthStencilClear const& clear) { UseTexture(clear.target.texture); }
     void UseTextures(TextureClear const& clear) { UseTexture(clear.target.texture); }
     void UseTextures(Discard const& discard) { UseTexture(discard.target.texture); }
+    void UseTextures(MipmapUpdate const& update) { UseTexture(update.texture); }
     template <class Copy>
     void UseTextures(Copy const& copy) {
         UseTexture(copy.from.texture);

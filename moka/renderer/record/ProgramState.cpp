@@ -37,7 +37,7 @@ bool ProgramState::BuildIn(std::shared_ptr<Recorder> const& recorder) {
     mLayout = std::move(layout);
     mValues = std::move(values);
     listed = {};
-    for (Handle& handle : mHandles) handle.uniform = Find(mLayout, handle.name);
+    for (Handle& handle : mHandles) handle = Resolve(handle.name, mLayout);
     if (mName != 0) ++recorder->counters.programs;
     return mName != 0;
 }
@@ -62,8 +62,13 @@ std::size_t ProgramState::AddHandle(char const* name) {
     for (std::size_t i = 0; i < mHandles.size(); ++i) {
         if (mHandles[i].name == text) return i;
     }
-    mHandles.push_back({text, Find(mLayout, text)});
+    mHandles.push_back(Resolve(text, mLayout));
     return mHandles.size() - 1;
+}
+
+ProgramState::Handle ProgramState::Resolve(std::string const& name, ProgramLayout const& layout) {
+    ProgramLayout::Uniform const* const uniform = Find(layout, name);
+    return {name, uniform ? uniform->type : BindingTypeUnknown, uniform ? uniform->offset : 0};
 }
 
 ProgramLayout::Uniform const* ProgramState::Find(ProgramLayout const& layout, std::string const& name) {
@@ -73,15 +78,12 @@ ProgramLayout::Uniform const* ProgramState::Find(ProgramLayout const& layout, st
     return nullptr;
 }
 
-BindingType ProgramState::GetType(std::size_t handle) const {
-    ProgramLayout::Uniform const* const uniform = mHandles[handle].uniform;
-    return uniform ? uniform->type : BindingTypeUnknown;
-}
+BindingType ProgramState::GetType(std::size_t handle) const { return mHandles[handle].type; }
 
 namespace {
 
-// Whether the value was another one.
-template <class Word, std::size_t kWords>
+// Whether the value was another one. In line: twice as fast as memcmp.
+template <class Word, std::size_t kWords = 1>
 bool Replace(unsigned char* kept, void const* value) {
     Word before[kWords];
     Word now[kWords];
@@ -94,29 +96,34 @@ bool Replace(unsigned char* kept, void const* value) {
     return true;
 }
 
-// Of the sizes that values have; comparing them in line is twice as fast as memcmp.
-bool Replace(unsigned char* kept, void const* value, std::size_t size) {
-    switch (size) {
-    case 16 * sizeof(float):
+bool Replace(unsigned char* kept, void const* value, BindingType type) {
+    switch (type) {
+    case BindingTypeMatrix4:
         return Replace<std::uint64_t, 8>(kept, value);
-    case 4 * sizeof(float):
+    case BindingTypeVector4:
         return Replace<std::uint64_t, 2>(kept, value);
-    case 2 * sizeof(float):
-        return Replace<std::uint64_t, 1>(kept, value);
-    default:
-        return Replace<std::uint32_t, 1>(kept, value);
+    case BindingTypeVector2:
+        return Replace<std::uint64_t>(kept, value);
+    case BindingTypeFloat:
+    case BindingTypeInt:
+    case BindingTypeTextureUnit:
+        return Replace<std::uint32_t>(kept, value);
+    case BindingTypeBool: {
+        // Callers hand over a bool, of which only one byte is there to be read.
+        std::int32_t const flag = *static_cast<bool const*>(value) ? 1 : 0;
+        return Replace<std::uint32_t>(kept, &flag);
     }
+    case BindingTypeUnknown:
+        break;
+    }
+    return false;
 }
 
 } // namespace
 
 bool ProgramState::Set(std::size_t handle, void const* value) {
-    ProgramLayout::Uniform const* const uniform = mHandles[handle].uniform;
-    if (!uniform || mIsReleased) return false;
-    // Callers hand over a bool, of which only one byte is there to be read.
-    bool const isBool = uniform->type == BindingTypeBool;
-    std::int32_t const flag = isBool && *static_cast<bool const*>(value) ? 1 : 0;
-    if (!Replace(&mValues[uniform->offset], isBool ? &flag : value, uniform->size)) return false;
+    Handle const& place = mHandles[handle];
+    if (mIsReleased || !Replace(mValues.data() + place.offset, value, place.type)) return false;
     listed.isStale = true;
     return true;
 }

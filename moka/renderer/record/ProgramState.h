@@ -57,8 +57,11 @@ public:
 private:
     struct Handle {
         std::string name;
-        ProgramLayout::Uniform const* uniform; // of the layout, which a driver orders as it likes; or null
+        BindingType type;   // BindingTypeUnknown: the program has no such uniform
+        std::size_t offset; // of its value
     };
+
+    static Handle Resolve(std::string const& name, ProgramLayout const& layout);
 
     static ProgramLayout::Uniform const* Find(ProgramLayout const& layout, std::string const& name);
     void CopyValues(ProgramLayout const& layout, std::vector<unsigned char>& values) const;

@@ -76,9 +76,13 @@ bool Recorder::Draw(GraphicsObject& object, int format, PrimitiveType primitive,
         mDevice->RestoreHost(HostState::All);
     }
     RunState& state = requested->Resolve(mActive ? mActive->GetRef() : GetCurrentTarget(), format, primitive);
-    if (state.target.texture != 0 && program->GetSamplerCount() > 0) SampleCopyOfTarget(state);
+    if (program->GetSamplerCount() > 0) {
+        if (state.target.texture != 0) SampleCopyOfTarget(state);
+        for (TextureRef const& texture : state.textures) UpdateMipmaps(texture);
+    }
     if (mStencils.IsPending() && TakeForStencil(state, object, first, count)) return true;
     BeforeDraw(state, object.GetBounds());
+    mipmaps.Forget(state.target.texture);
     // Only now: a flush on the way here takes vertices out of the list.
     list.AddDraw(state, !requested->IsChanged(), *program,
                  {object.PlaceVertices(), first, count, object.GetBounds()});
@@ -116,10 +120,19 @@ void Recorder::SampleCopyOfTarget(RunState& state) {
         if (mTargetCopy) {
             TargetRef const copy = mTargetCopy->Describe(0);
             list.Add(TargetCopy{state.target, copy, copy.width, copy.height});
+            mipmaps.Forget(copy.texture);
         }
         texture.texture = mTargetCopy ? mTargetCopy->GetName() : 0;
         requested->SetChanged(true);
     }
+}
+
+bool Recorder::UpdateMipmaps(TextureRef const& texture) {
+    if (texture.sampling.minFilter != TextureFilterMipmapped || texture.texture == 0) return false;
+    if (mipmaps.IsCurrent(texture.texture)) return false;
+    list.Add(MipmapUpdate{texture.texture});
+    mipmaps.SetCurrent(texture.texture);
+    return true;
 }
 
 void Recorder::AfterDraw() {
@@ -177,6 +190,11 @@ void Recorder::CompleteStencils() {
     if (mActive) mStencils.Complete(mActive->GetRef());
 }
 
+// External GL draws into it.
+void Recorder::ForgetMipmapsOfTarget() {
+    if (mActive) mipmaps.Forget(mActive->GetRef().texture);
+}
+
 void Recorder::CommitStates() {
     StateCommit commit;
     requested->AddStatesTo(commit);
@@ -194,8 +212,11 @@ void Recorder::FlushForHost() {
 void Recorder::CommitForExternal() {
     if (!Begin()) return;
     CompleteStencils();
+    std::vector<TextureRef> const& textures = requested->GetTextures();
+    for (TextureRef const& texture : textures) UpdateMipmaps(texture);
     Flush();
     mStencils.ForgetAll();
+    ForgetMipmapsOfTarget();
     StateCommit commit;
     requested->AddStatesTo(commit);
     if (mActive) commit.target = &mActive->GetRef();
@@ -203,7 +224,6 @@ void Recorder::CommitForExternal() {
         commit.program = program->GetName();
         commit.values = program->GetValues().data();
     }
-    std::vector<TextureRef> const& textures = requested->GetTextures();
     commit.textures = textures.data();
     commit.textureCount = textures.size();
     mDevice->Commit(commit);
@@ -218,6 +238,7 @@ void Recorder::InvalidateState() {
     if (!Begin()) return;
     CompleteStencils();
     mStencils.ForgetAll();
+    ForgetMipmapsOfTarget();
     mDevice->InvalidateState();
     requested->Forget();
 }
@@ -277,6 +298,7 @@ void Recorder::Delete(Dropped const& dropped) {
     switch (dropped.kind) {
     case DroppedKind::Texture:
         list.ForgetTexture(dropped.name);
+        mipmaps.Forget(dropped.name);
         mDevice->DeleteTexture(dropped.name);
         --counters.textures;
         return;

@@ -14,6 +14,7 @@
 #include "moka/renderer/record/DepthStencilPool.h"
 #include "moka/renderer/record/DrawListBuilder.h"
 #include "moka/renderer/record/Fill.h"
+#include "moka/renderer/record/Mipmaps.h"
 #include "moka/renderer/record/RequestedState.h"
 #include "moka/renderer/record/StencilPreparations.h"
 
@@ -78,6 +79,9 @@ public:
         if (state.depthStencil.IsStencil()) mStencils.BeforeDraw(state, bounds);
     }
     void AfterDraw();
+    // Before the texture is sampled. True: its levels are made first, by a command of the list.
+    bool UpdateMipmaps(TextureRef const& texture);
+    bool FlushesAtOnce() const { return mFlushesAtOnce; }
     // The contents of the buffer are lost.
     void ForgetStencil(DeviceName depthStencil) { mStencils.Forget(depthStencil); }
     void Flush();
@@ -117,6 +121,7 @@ public:
     DrawListBuilder list{counters};
     DepthStencilPool depthStencilPool{*this};
     Fill fill;
+    Mipmaps mipmaps;
     // Present while attached.
     std::optional<RequestedState> requested;
 
@@ -141,6 +146,7 @@ private:
     void DeleteDropped();
     bool TakeForStencil(RunState const& state, GraphicsObject& object, int first, int count);
     void SampleCopyOfTarget(RunState& state);
+    void ForgetMipmapsOfTarget();
     void CommitStates();
     // Before the stencil of the active target is left to others, or what draws it goes. Throws bad_alloc.
     void CompleteStencils();

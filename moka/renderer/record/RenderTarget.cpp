@@ -13,7 +13,7 @@
 namespace Moka::detail {
 namespace {
 
-constexpr ObjectKind kKind = ObjectKind::kRenderTarget;
+constexpr ObjectKind kTargetKind = ObjectKind::kRenderTarget;
 
 } // namespace
 
@@ -28,12 +28,12 @@ RenderTarget::RenderTarget(std::shared_ptr<Recorder> recorder, std::shared_ptr<F
 RenderTarget::~RenderTarget() { --mRecorder->counters.renderTargets; }
 
 void RenderTarget::Activate() {
-    if (theObserver) Observe(kKind, this, "Activate");
+    if (theObserver) Observe(kTargetKind, this, "Activate");
     if (mRecorder->Begin()) mRecorder->Activate(*this);
 }
 
 void RenderTarget::Deactivate(bool discardColor, bool discardDepthStencil) {
-    if (theObserver) Observe(kKind, this, "Deactivate", discardColor, discardDepthStencil);
+    if (theObserver) Observe(kTargetKind, this, "Deactivate", discardColor, discardDepthStencil);
     if (!mRecorder->Begin() || mRecorder->GetActive() != this) return;
     if (discardColor || discardDepthStencil) {
         if (discardDepthStencil) mRecorder->ForgetStencil(mRef.depthStencil);
@@ -43,7 +43,7 @@ void RenderTarget::Deactivate(bool discardColor, bool discardDepthStencil) {
 }
 
 void RenderTarget::ReadPixels(int x, int y, int width, int height, PixelDestination const& destination) {
-    Observe(kKind, this, "ReadPixels", x, y, width, height, destination.rowLength, destination.skipRows,
+    Observe(kTargetKind, this, "ReadPixels", x, y, width, height, destination.rowLength, destination.skipRows,
             destination.skipPixels);
     RequestScope const scope(*mRecorder);
     if (!scope || !destination.pixels) return;
@@ -66,7 +66,7 @@ void RenderTarget::ReadPixels(int x, int y, int width, int height, PixelDestinat
 }
 
 void RenderTarget::Release() {
-    Observe(kKind, this, "Release");
+    Observe(kTargetKind, this, "Release");
     // Outlives this object.
     std::shared_ptr<Recorder> const recorder = mRecorder;
     RequestScope const scope(*recorder);
@@ -76,9 +76,10 @@ void RenderTarget::Release() {
 }
 
 void RenderTarget::ClearColor(float r, float g, float b, float a) {
-    Observe(kKind, this, "ClearColor", r, g, b, a);
+    Observe(kTargetKind, this, "ClearColor", r, g, b, a);
     RequestScope const scope(*mRecorder);
     if (!scope) return;
+    mRecorder->mipmaps.Forget(mRef.texture);
     std::array<float, 4> const color{r, g, b, a};
     RequestedState& requested = *mRecorder->requested;
     if (theObserver) theObserver->OnClear({requested, this, true, color, false, 0, false, 0});
@@ -94,7 +95,7 @@ void RenderTarget::ClearColor(float r, float g, float b, float a) {
 bool RenderTarget::HasStencil() const { return mDepthStencil || IsHosts(); }
 
 void RenderTarget::AttachDepthStencil(IDepthStencilBuffer* buffer) {
-    Observe(kKind, this, "AttachDepthStencil", static_cast<void const*>(buffer));
+    Observe(kTargetKind, this, "AttachDepthStencil", static_cast<void const*>(buffer));
     RequestScope const scope(*mRecorder);
     if (!scope) return;
     auto* const wanted = static_cast<DepthStencilBuffer*>(buffer);
@@ -120,7 +121,7 @@ bool RenderTarget::MayAttach(DepthStencilBuffer const& buffer) const {
 }
 
 void RenderTarget::DetachDepthStencil() {
-    Observe(kKind, this, "DetachDepthStencil", static_cast<void const*>(mDepthStencil));
+    Observe(kTargetKind, this, "DetachDepthStencil", static_cast<void const*>(mDepthStencil));
     RequestScope const scope(*mRecorder);
     if (scope) ForgetDepthStencil();
 }
@@ -133,7 +134,7 @@ void RenderTarget::ForgetDepthStencil() {
 }
 
 void RenderTarget::ClearDepthStencil(bool clearDepth, float depth, bool clearStencil, int stencil) {
-    Observe(kKind, this, "ClearDepthStencil", clearDepth, depth, clearStencil, stencil);
+    Observe(kTargetKind, this, "ClearDepthStencil", clearDepth, depth, clearStencil, stencil);
     RequestScope const scope(*mRecorder);
     if (!scope) return;
     RequestedState& requested = *mRecorder->requested;

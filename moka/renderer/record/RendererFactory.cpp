@@ -277,6 +277,13 @@ IRasterizerState* RendererFactory::GetRasterizerState() {
     return &rasterizer;
 }
 
+RenderTargetSize RendererFactory::GetActiveTargetSize() {
+    Recorder const* const recorder = GetAttachedRecorder();
+    if (!recorder || !recorder->GetActive()) return {};
+    TargetRef const& target = recorder->GetActive()->GetRef();
+    return {target.width, target.height};
+}
+
 void RendererFactory::SetStencilClip(bool on) {
     if (theObserver) Observe(kRenderer, nullptr, "SetStencilClip", on);
     if (Recorder* const recorder = GetAttachedRecorder()) recorder->requested->SetStencilClip(on);

@@ -11,7 +11,7 @@
 namespace Moka::detail {
 namespace {
 
-constexpr ObjectKind kKind = ObjectKind::kProgram;
+constexpr ObjectKind kProgramKind = ObjectKind::kProgram;
 
 void CommitProgram(Recorder& recorder, ProgramState const& program) {
     recorder.CommitAtOnce([&](StateCommit& commit) {
@@ -27,7 +27,9 @@ public:
           mProgram(std::move(program)),
           mObject(object),
           mHandle(handle) {}
-    ~Parameter() override { Observe(kKind, mObject, "ReleaseParameter", mProgram->GetHandleName(mHandle)); }
+    ~Parameter() override {
+        Observe(kProgramKind, mObject, "ReleaseParameter", mProgram->GetHandleName(mHandle));
+    }
 
     void Set(void const* value) override {
         if (theObserver) {
@@ -88,7 +90,7 @@ IShaderProgram* ShaderProgram::GetInert() {
 
 void ShaderProgram::MakeCurrent() {
     IShaderProgram* const self = this;
-    if (theObserver) Observe(kKind, self, "MakeCurrent");
+    if (theObserver) Observe(kProgramKind, self, "MakeCurrent");
     Recorder* const recorder = GetAttachedRecorder();
     if (!recorder || !recorder->Begin()) return;
     if (mState->GetRecorder() != recorder) {
@@ -104,7 +106,7 @@ void ShaderProgram::MakeCurrent() {
 
 void ShaderProgram::Release() {
     IShaderProgram* const self = this;
-    Observe(kKind, self, "Release");
+    Observe(kProgramKind, self, "Release");
     mState->Release();
     delete this;
 }
@@ -113,7 +115,7 @@ IParameterBinding* ShaderProgram::GetParameter(char const* name) {
     IShaderProgram* const self = this;
     try {
         auto* const parameter = new Parameter(mState, self, mState->AddHandle(name));
-        Observe(kKind, self, "GetParameter", name ? name : "null", parameter->GetType());
+        Observe(kProgramKind, self, "GetParameter", name ? name : "null", parameter->GetType());
         return parameter;
     } catch (std::bad_alloc const&) {
         return InertParameter::Get();

@@ -14,14 +14,14 @@
 namespace Moka::detail {
 namespace {
 
-constexpr ObjectKind kKind = ObjectKind::kTexture;
+constexpr ObjectKind kTextureKind = ObjectKind::kTexture;
 
 bool IsWrap(int value) {
     return value == TextureWrapRepeat || value == TextureWrapClampToEdge ||
            value == TextureWrapMirroredRepeat;
 }
 
-bool IsFilter(int value) { return value == TextureFilterNearest || value == TextureFilterLinear; }
+bool IsFilter(int value) { return value >= TextureFilterNearest && value <= TextureFilterMipmapped; }
 
 // False for a parameter or a value that does not exist.
 bool StoreParameter(Sampling& sampling, int id, int value) {
@@ -37,7 +37,11 @@ bool StoreParameter(Sampling& sampling, int id, int value) {
     case TextureParamFilteringMag: {
         if (!IsFilter(value)) return false;
         auto const filter = static_cast<TextureParamFilteringValue>(value);
-        (id == TextureParamFilteringMin ? sampling.minFilter : sampling.magFilter) = filter;
+        if (id == TextureParamFilteringMin) {
+            sampling.minFilter = filter;
+        } else { // levels are for shrinking alone
+            sampling.magFilter = filter == TextureFilterMipmapped ? TextureFilterLinear : filter;
+        }
         return true;
     }
     default:
@@ -52,12 +56,12 @@ TextureObject::TextureObject(std::shared_ptr<TextureStorage> storage) : mStorage
 }
 
 TextureObject::~TextureObject() {
-    Observe(kKind, static_cast<ITextureObject*>(this), "Release");
+    Observe(kTextureKind, static_cast<ITextureObject*>(this), "Release");
     mStorage->GetRecorder()->DropTextureObject();
 }
 
 void TextureObject::SetLabel(char const* text) {
-    Observe(kKind, static_cast<ITextureObject*>(this), "SetLabel", text ? text : "");
+    Observe(kTextureKind, static_cast<ITextureObject*>(this), "SetLabel", text ? text : "");
     try {
         mLabel = text ? text : "";
     } catch (std::bad_alloc const&) {
@@ -68,7 +72,7 @@ void TextureObject::SetLabel(char const* text) {
 }
 
 void TextureObject::Bind(int unit) {
-    Observe(kKind, static_cast<ITextureObject*>(this), "Bind", unit);
+    Observe(kTextureKind, static_cast<ITextureObject*>(this), "Bind", unit);
     Recorder& recorder = *mStorage->GetRecorder();
     if (!recorder.Begin()) return;
     int const count = recorder.requested->GetUnitCount();
@@ -80,6 +84,8 @@ void TextureObject::Bind(int unit) {
     }
     recorder.requested->SetTexture(unit, mStorage, mSampling);
     TextureRef const texture{mStorage->GetName(), mSampling, unit};
+    // External GL may sample it before the next draw of ours.
+    if (recorder.FlushesAtOnce() && recorder.UpdateMipmaps(texture)) recorder.Flush();
     recorder.CommitAtOnce([&](StateCommit& commit) {
         commit.textures = &texture;
         commit.textureCount = 1;
@@ -87,12 +93,12 @@ void TextureObject::Bind(int unit) {
 }
 
 void TextureObject::Replace(void const* pixels, int stride) {
-    Observe(kKind, static_cast<ITextureObject*>(this), "Replace", pixels ? "pixels" : "null", stride);
+    Observe(kTextureKind, static_cast<ITextureObject*>(this), "Replace", pixels ? "pixels" : "null", stride);
     Upload(Rect(0, 0, GetWidth(), GetHeight()), pixels, stride);
 }
 
 void TextureObject::Replace(Rect const& rect, void const* pixels, int stride) {
-    Observe(kKind, static_cast<ITextureObject*>(this), "Replace", rect.left, rect.top, rect.right,
+    Observe(kTextureKind, static_cast<ITextureObject*>(this), "Replace", rect.left, rect.top, rect.right,
             rect.bottom, pixels ? "pixels" : "null", stride);
     Upload(rect, pixels, stride);
 }
@@ -115,22 +121,25 @@ void TextureObject::Upload(Rect const& rect, void const* pixels, int stride) {
     TraceScope const trace("renderer", "Upload", "bytes", block.GetBytes());
     recorder.FlushIfUsed(mStorage->GetName());
     recorder.GetDevice().Upload(mStorage->GetName(), block, pixels, stride > 0 ? stride : tight);
+    recorder.mipmaps.Forget(mStorage->GetName());
     recorder.counters.bytesUploaded += block.GetBytes();
 }
 
 void TextureObject::DrawToCurrent() {
-    Observe(kKind, static_cast<ITextureObject*>(this), "DrawToCurrent");
+    Observe(kTextureKind, static_cast<ITextureObject*>(this), "DrawToCurrent");
     Recorder& recorder = *mStorage->GetRecorder();
     RequestScope const scope(recorder);
     if (!scope || IsActiveTarget()) return;
     DeviceName const frameBuffer = mStorage->TakeFrameBuffer();
     if (frameBuffer == 0) return;
-    recorder.Add(TextureDraw{mStorage->Describe(frameBuffer), recorder.GetCurrentTarget()});
+    TargetRef const to = recorder.GetCurrentTarget();
+    recorder.mipmaps.Forget(to.texture);
+    recorder.Add(TextureDraw{mStorage->Describe(frameBuffer), to});
     mStorage->ReturnFrameBuffer(frameBuffer);
 }
 
 void TextureObject::SetParameter(int id, int value) {
-    Observe(kKind, static_cast<ITextureObject*>(this), "SetParameter", id, value);
+    Observe(kTextureKind, static_cast<ITextureObject*>(this), "SetParameter", id, value);
     Store(id, value);
 }
 
@@ -138,12 +147,12 @@ void TextureObject::Store(int id, int value) {
     if (StoreParameter(mSampling, id, value)) return;
     __android_log_print(ANDROID_LOG_ERROR, "mok_log",
                         "texture parameter %d = %d is refused (\"%s\"); wrapping is 0 and 1 with value 0, "
-                        "1 or 3, filtering 4 and 5 with value 0 or 1",
+                        "1 or 3, filtering 4 and 5 with value 0, 1 or 2",
                         id, value, GetLabel());
 }
 
 void TextureObject::CopyFromRenderTarget() {
-    Observe(kKind, static_cast<ITextureObject*>(this), "CopyFromRenderTarget");
+    Observe(kTextureKind, static_cast<ITextureObject*>(this), "CopyFromRenderTarget");
     Recorder& recorder = *mStorage->GetRecorder();
     RequestScope const scope(recorder);
     if (!scope || IsActiveTarget()) return;
@@ -152,6 +161,7 @@ void TextureObject::CopyFromRenderTarget() {
     DeviceName const own = from.texture == 0 ? mStorage->TakeFrameBuffer() : 0;
     int const width = from.width > 0 ? std::min(from.width, GetWidth()) : GetWidth();
     int const height = from.height > 0 ? std::min(from.height, GetHeight()) : GetHeight();
+    recorder.mipmaps.Forget(mStorage->GetName());
     recorder.Add(TargetCopy{from, mStorage->Describe(own), width, height});
     if (own != 0) mStorage->ReturnFrameBuffer(own);
 }

@@ -2,7 +2,6 @@
 #include "moka/base/log/LogSink.h"
 #include "moka/graphics/MokaGraphics.h"
 #include "moka/graphics/jni/OnLoad.h"
-#include "tests/jvm/host/Journey.h"
 
 #include <cstring>
 #include <jni.h>
@@ -119,9 +118,5 @@ JNIEXPORT jdoubleArray JNICALL Java_moka_Host_readDisplay(JNIEnv* env, jclass, j
     jdoubleArray const array = env->NewDoubleArray(count);
     env->SetDoubleArrayRegion(array, 0, count, values);
     return array;
-}
-
-JNIEXPORT jstring JNICALL Java_moka_Host_loadDrawSave(JNIEnv* env, jclass, jstring from, jstring to) {
-    return env->NewStringUTF(Testing::LoadDrawSave(javaVm, ToString(env, from), ToString(env, to)).c_str());
 }
 }

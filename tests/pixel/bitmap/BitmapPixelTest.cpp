@@ -2,13 +2,10 @@
 #include "moka/base/RefPtr.h"
 #include "moka/base/log/AndroidLog.h"
 #include "moka/graphics/bitmap/IMKBitmap.h"
-#include "moka/graphics/bitmap/IMKBitmapCanvasAttachable.h"
-#include "moka/graphics/bitmap/IMKBitmapWritable.h"
 #include "moka/graphics/bitmap/IMKSubBitmap.h"
 #include "moka/graphics/bitmap/IMKTextureBitmap.h"
 #include "moka/graphics/factory/BitmapsAndCanvases.h"
 #include "moka/host/RenderThread.h"
-#include "moka/renderer/IRendererDeviceCaps.h"
 #include "moka/renderer/RendererFactory.h"
 #include "tests/support/ImageCompare.h"
 #include "tests/support/LogCapture.h"
@@ -99,18 +96,6 @@ TEST_F(PixelBitmap, ReadsBlocksOverStripEdgesAndPartlyOutside) {
     EXPECT_EQ(bitmap->GetPixel(Point(40, 2 * kMaxSide + 20)), 0u);
 }
 
-TEST_F(PixelBitmap, WithoutPixelsItIsTransparentAndUpdatesLandWhereTheyShould) {
-    auto const bitmap = NewBitmap(*queue, 32, kMaxSide + 8);
-    Picture expected(32, kMaxSide + 8);
-    ExpectSame(Read(bitmap), expected);
-    Picture const patch = MakeGradient(10, 6);
-    Rect const r(4, 20, 14, 26);
-    bitmap->GetTextureBitmap()->UpdateBitmap(r, patch.pixels.data(), patch.GetStride());
-    for (int y = 0; y < 6; ++y)
-        for (int x = 0; x < 10; ++x) expected.SetColor(4 + x, 20 + y, patch.GetColor(x, y));
-    ExpectSame(Read(bitmap), expected);
-}
-
 TEST_F(PixelBitmap, AShareSeesUpdatesWhoeverGoesFirstAndAStripsCloneDoesNot) {
     Picture const image = MakeGradient(33, kMaxSide + 3);
     Picture const other = MakeChecker(33, kMaxSide + 3, 2, {255, 0, 0, 255}, {0, 0, 255, 255});
@@ -129,38 +114,6 @@ TEST_F(PixelBitmap, AShareSeesUpdatesWhoeverGoesFirstAndAStripsCloneDoesNot) {
         copy->GetBitmapData(Rect(0, 0, 33, kMaxSide), read.pixels.data());
         ExpectSame(read, image.Crop(0, 0, 33, kMaxSide));
     }
-}
-
-TEST_F(PixelBitmap, ClearsReachEveryStripThroughTheRenderSide) {
-    auto const bitmap = NewBitmap(*queue, 8, 2 * kMaxSide);
-    bitmap->GetBitmapCanvasAttachable()->AttachToCanvas();
-    ASSERT_TRUE(queue->Call([&] {
-        bitmap->GetBitmapWritable()->ActivateFrameBufferRT(false);
-        bitmap->GetTextureBitmap()->AttachStencilBufferRT(false);
-        bitmap->GetBitmapWritable()->ClearColorRT(0.2f, 0.4f, 0.6f, 0.8f);
-        bitmap->GetBitmapWritable()->ClearDepthStencilRT(true, 1, true, 3);
-        bitmap->GetTextureBitmap()->DetachStencilBufferRT(false);
-        bitmap->GetBitmapWritable()->DeactivateFrameBufferRT(false, DiscardFramebufferDepthStencil);
-    }));
-    bitmap->GetBitmapCanvasAttachable()->DetachFromCanvas();
-    Picture const read = Read(bitmap);
-    EXPECT_EQ(read.GetColor(0, 0), (Color{51, 102, 153, 204}));
-    EXPECT_EQ(read.GetColor(7, 2 * kMaxSide - 1), (Color{51, 102, 153, 204}));
-}
-
-TEST_F(PixelBitmap, TheRenderThreadFlavourGivesTheSame) {
-    Picture const image = MakeGradient(20, 2 * kMaxSide + 1);
-    Picture direct(image.width, image.height);
-    Picture shared(image.width, image.height);
-    ASSERT_TRUE(queue->Call([&] {
-        auto const bitmap =
-            NewBitmap(*queue, image.width, image.height, image.pixels.data(), UseFrom::RenderThread);
-        bitmap->GetBitmapData(bitmap->GetBitmapRect(), direct.pixels.data());
-        auto const share = NewSharedBitmap(*queue, bitmap, UseFrom::RenderThread);
-        share->GetBitmapData(bitmap->GetBitmapRect(), shared.pixels.data());
-    }));
-    ExpectSame(direct, image);
-    ExpectSame(shared, image);
 }
 
 TEST_F(PixelBitmap, ASavedBitmapIsLoadedWithEveryPixelAndAMissingFileSaysWhy) {
@@ -199,16 +152,6 @@ TEST_F(PixelBitmap, RowsThatAreNotTightlyPackedArriveWithoutTheirGaps) {
     ASSERT_TRUE(wide->Construct(image.pixels.data(), 16, 10, image.GetStride(), Bitmap::kFormatRgba8888,
                                 false, false));
     ExpectSame(Read(NewBitmap(*queue, std::move(wide))), image.Crop(0, 0, 16, 10));
-}
-
-TEST_F(PixelBitmap, AWidthOverTheLimitIsReportedAndInert) {
-    auto const bitmap = Create(MakeGradient(kMaxSide + 1, 4));
-    Picture block(4, 4);
-    std::memset(block.pixels.data(), 1, block.pixels.size());
-    bitmap->GetBitmapData(Rect(0, 0, 4, 4), block.pixels.data());
-    EXPECT_EQ(block.GetColor(0, 0), (Color{1, 1, 1, 1}));
-    EXPECT_EQ(log.Count(ANDROID_LOG_ERROR), 1);
-    log.Clear();
 }
 
 } // namespace

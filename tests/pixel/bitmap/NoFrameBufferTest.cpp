@@ -6,18 +6,18 @@
 #include "moka/graphics/bitmap/IMKTextureBitmap.h"
 #include "moka/graphics/drawable/MKNonPremultipliedColorDrawable.h"
 #include "moka/graphics/factory/BitmapsAndCanvases.h"
+#include "moka/graphics/paint/MKPaint.h"
 #include "moka/host/RenderThread.h"
 #include "moka/renderer/IRenderTarget.h"
 #include "moka/renderer/RendererFactory.h"
+#include "scenes/SceneRenderer.h"
 #include "tests/support/ImageCompare.h"
 #include "tests/support/LogCapture.h"
 #include "tests/support/NothingLeft.h"
 #include "tests/support/TestImages.h"
-#include "tests/unit/canvas/EveryOperation.h"
 
 #include <gtest/gtest.h>
 
-#include <functional>
 #include <memory>
 #include <string>
 
@@ -25,8 +25,8 @@ namespace Moka::Testing {
 namespace {
 
 using BitmapPtr = RefPtr<IMKBitmap>;
-using CanvasPtr = RefPtr<IMKCanvas>;
-constexpr int kSide = 64; // of the window, and the most that a texture may have
+constexpr int kSide = 64;      // of the window
+constexpr int kMaxSide = 1024; // of a texture
 constexpr Color kWindow{51, 102, 153, 255};
 
 // Hands tasks on to the render thread, but for the ordinal-th from now.
@@ -46,7 +46,7 @@ class NoFrameBuffer : public ::testing::Test {
 protected:
     void SetUp() override {
         RenderThreadOptions options;
-        options.limits.maxTextureSize = kSide;
+        options.limits.maxTextureSize = kMaxSide;
         options.debugContext = true;
         options.surfaceWidth = options.surfaceHeight = kSide;
         std::string error;
@@ -57,17 +57,9 @@ protected:
             window = RendererFactory::CreateRenderTargetFromDefault(kSide, kSide);
             window->ClearColor(0.2f, 0.4f, 0.6f, 1);
         });
-        Picture const white = MakeChecker(8, 8, 1, {255, 255, 255, 255}, {255, 255, 255, 255});
-        source = Create(8, 8, white.pixels.data());
-        custom =
-            RefPtr<MKNonPremultipliedColorDrawable>::Adopt(new MKNonPremultipliedColorDrawable(queue.get()));
-        custom->SetBitmap(source.Get(), source.Get());
-        thread->WaitForTasks(); // the image may go
     }
 
     void TearDown() override {
-        custom = {};
-        source = {};
         thread->Call([this] { window->Release(); });
         thread->WaitForTasks(); // what goes last posts the end of what it held
         ExpectNothingLeft(RendererFactory::GetStatistics());
@@ -77,6 +69,13 @@ protected:
 
     BitmapPtr Create(int width, int height, void const* pixels = nullptr) {
         return NewBitmap(*queue, width, height, pixels);
+    }
+
+    // All that need no pen, with their bitmaps or without.
+    void DrawScenes(RefPtr<IMKCanvas> const& canvas) {
+        Scenes::QueueStage stage(*queue);
+        for (Scenes::Scene const& scene : Scenes::GetScenes())
+            if (!scene.needsPen) DrawScene(scene, *canvas, stage);
     }
 
     Picture ReadWindow() {
@@ -94,16 +93,13 @@ protected:
     std::unique_ptr<RenderThread> thread;
     std::unique_ptr<PickyQueue> queue;
     IRenderTarget* window = nullptr;
-    BitmapPtr source;
-    RefPtr<MKNonPremultipliedColorDrawable> custom;
 };
 
 TEST_F(NoFrameBuffer, OfABitmapThatIsTooWideNothingIsDrawnAndOneErrorTellsOfIt) {
-    BitmapPtr const bitmap = Create(kSide + 1, kSide);
-    DrawEverything(*NewCanvas(*queue, bitmap), source.Get(), custom.Get());
+    DrawScenes(NewCanvas(*queue, Create(kMaxSide + 1, kSide)));
     ExpectWindowUntouched("too wide");
     EXPECT_EQ(log.Count(ANDROID_LOG_ERROR), 1);
-    EXPECT_EQ(log.Count(ANDROID_LOG_ERROR, "65 x 64 is refused"), 1);
+    EXPECT_EQ(log.Count(ANDROID_LOG_ERROR, "1025 x 64 is refused"), 1);
     log.Clear();
 }
 
@@ -112,22 +108,24 @@ TEST_F(NoFrameBuffer, OfABitmapWhoseTaskWasRefusedNothingIsDrawn) {
         if (texture) queue->Refuse(1);
         BitmapPtr const bitmap = Create(kSide, kSide);
         if (!texture) queue->Refuse(1);
-        DrawEverything(*NewCanvas(*queue, bitmap), source.Get(), custom.Get());
+        DrawScenes(NewCanvas(*queue, bitmap));
         ExpectWindowUntouched(texture ? "no texture" : "no frame buffer");
         bitmap->GetTextureBitmap()->GetSubBitmap(0)->Unref(); // the reference of the refused task
     }
 }
 
 TEST_F(NoFrameBuffer, OfABitmapThatIsYetToBeCreatedNothingIsDrawn) {
-    thread->Call([this] {
-        BitmapPtr const bitmap = Create(kSide, kSide);
-        DrawEverything(*NewCanvas(*queue, bitmap, UseFrom::RenderThread), source.Get(), custom.Get());
-    });
+    thread->Call([this] { DrawScenes(NewCanvas(*queue, Create(kSide, kSide), UseFrom::RenderThread)); });
     ExpectWindowUntouched("too early");
 }
 
 TEST_F(NoFrameBuffer, WhatTheHostDrawsItselfWithoutATargetReachesItsWindow) {
-    thread->Call([this] { custom->DrawRT(Matrix4<float>(), MKPaint()); });
+    Picture const white = MakeChecker(8, 8, 1, {255, 255, 255, 255}, {255, 255, 255, 255});
+    BitmapPtr const source = Create(8, 8, white.pixels.data());
+    auto const custom =
+        RefPtr<MKNonPremultipliedColorDrawable>::Adopt(new MKNonPremultipliedColorDrawable(queue.get()));
+    custom->SetBitmap(source.Get(), source.Get());
+    thread->Call([&] { custom->DrawRT(Matrix4<float>(), MKPaint()); });
     EXPECT_EQ(ReadWindow().GetColor(kSide - 1, kSide - 1), (Color{255, 255, 255, 255}));
 }
 

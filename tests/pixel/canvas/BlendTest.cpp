@@ -82,59 +82,5 @@ TEST_P(EveryMode, BlendsBitmapsByItsEquation) {
 
 INSTANTIATE_TEST_SUITE_P(All, EveryMode, ::testing::Range(0, 20));
 
-class BlendTest : public CanvasDrawing {};
-
-// Both look at what is there: a copy, which a scissor must not cut short.
-TEST_F(BlendTest, DarkenAndLightenSeeTheDestinationUnderEveryClipAndStrip) {
-    for (int const side : {64, kLarge}) {
-        UseLargestSide(side);
-        for (MKPaint::XFermode const mode : {MKPaint::Darken, MKPaint::Lighten}) {
-            MKPaint const paint = MakePaint(mode);
-            ExpectLikeReference({MakeBackdrop(60, 150),
-                                 [&](IMKCanvas& canvas, Scenes::SceneStage& stage) {
-                                     auto const bitmap = MakeBitmap(stage, MakeSource());
-                                     canvas.DrawBitmap(bitmap.Get(), 3, 5, &paint);
-                                     canvas.SetClipRect(10, 20, 30, 100, IMKCanvasBase::Intersect);
-                                     canvas.DrawBitmap(bitmap.Get(), 3, 14, &paint);
-                                     canvas.DrawBitmap(bitmap.Get(), 12, 56, &paint);
-                                     canvas.SetClipRect(14, 60, 30, 4, IMKCanvasBase::Difference);
-                                     canvas.DrawBitmap(bitmap.Get(), 20, 58, &paint);
-                                     canvas.DrawBitmap(bitmap.Get(), 12, 120, &paint);
-                                 }},
-                                "mode " + std::to_string(mode) + " side " + std::to_string(side));
-        }
-    }
-}
-
-// What their programs discard, inside a stroke and around a corner, keeps the destination in every mode.
-TEST_F(BlendTest, AReplacingStrokeLeavesWhatItEncloses) {
-    MKPaint paint = MakePaint(MKPaint::Src);
-    paint.SetColor(0.9f, 0.5f, 0.2f, 0.8f);
-    paint.SetStyle(MKPaint::Stroke);
-    paint.SetLineWidth(3);
-    ExpectLikeReference({MakeBackdrop(90, 60),
-                         [&](IMKCanvas& canvas, Scenes::SceneStage&) {
-                             canvas.DrawRoundRect(6, 6, 46, 50, 16, 12, &paint);
-                             canvas.DrawCircle(68, 28, 15, &paint);
-                         }},
-                        "replacing strokes");
-}
-
-TEST_F(BlendTest, ColoursBeyondTheirRangeAreCutOff) {
-    MKPaint paint;
-    paint.SetColor(2, -1, 0.5f, 1.5f);
-    MKPaint tinted;
-    tinted.SetColor(0, 0, 0, 0.5f);
-    tinted.SetTintColor(1, 0.5f, 0.25f, 0.5f);
-    ExpectLikeReference({MakeBackdrop(32, 32),
-                         [&](IMKCanvas& canvas, Scenes::SceneStage&) {
-                             canvas.DrawRect(2, 2, 14, 14, &paint);
-                             canvas.DrawRect(16, 2, 30, 14, &tinted);
-                             canvas.DrawRect(2, 16, 14, 30, nullptr);
-                             canvas.DrawCircle(22, 22, 7, &tinted);
-                         }},
-                        "colours");
-}
-
 } // namespace
 } // namespace Moka::Testing

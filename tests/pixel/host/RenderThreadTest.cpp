@@ -1,7 +1,6 @@
 #include "moka/host/RenderThread.h"
 
 #include "moka/base/log/AndroidLog.h"
-#include "moka/graphics/task/WorkerTask.h"
 #include "moka/renderer/IRenderTarget.h"
 #include "moka/renderer/IRendererDeviceCaps.h"
 #include "moka/renderer/ITextureObject.h"
@@ -72,8 +71,15 @@ TEST_F(RenderThreadTest, StartsStopsAndStartsAgain) {
         RecordProperty("path", info.path);
         RecordProperty("renderer", info.renderer);
 
+        EXPECT_FALSE(thread->Call([] { throw std::runtime_error("spilled ink"); }));
+        EXPECT_EQ(log.Count(ANDROID_LOG_ERROR, "spilled ink"), 1);
+        log.Clear();
+        std::thread::id inner;
         Pixel pixel{};
-        EXPECT_TRUE(thread->Call([&pixel] {
+        EXPECT_TRUE(thread->Call([&] {
+            std::thread::id const outer = std::this_thread::get_id();
+            EXPECT_TRUE(thread->Call([&] { inner = std::this_thread::get_id(); }));
+            EXPECT_EQ(outer, inner);
             ITextureObject* const texture = MakeTexture();
             IRenderTarget* const target = RendererFactory::CreateOffscreenRenderTarget(texture);
             target->ClearColor(1.0f, 0.4f, 0.0f, 1.0f);
@@ -114,32 +120,6 @@ TEST_F(RenderThreadTest, TurnsAwayASecondOneAndTheFirstGoesOnWithItsDefaultFrame
     EXPECT_EQ(stencilBits, 8);
     first.reset();
     EXPECT_TRUE(MustStart());
-}
-
-TEST_F(RenderThreadTest, CallRunsInOrderAndReportsWhatThrows) {
-    ThreadPtr const thread = MustStart();
-    ASSERT_TRUE(thread);
-    struct Counter {
-        int value = 0;
-        void Add() { ++value; }
-    } counter;
-    for (int i = 0; i < 100; ++i) WorkerTask::PostMember(thread.get(), &counter, &Counter::Add);
-    int seen = 0;
-    std::thread::id outer;
-    std::thread::id inner;
-    EXPECT_TRUE(thread->Call([&] {
-        seen = counter.value;
-        outer = std::this_thread::get_id();
-        EXPECT_TRUE(thread->Call([&] { inner = std::this_thread::get_id(); }));
-    }));
-    EXPECT_EQ(seen, 100);
-    EXPECT_NE(outer, std::this_thread::get_id());
-    EXPECT_EQ(outer, inner);
-
-    EXPECT_FALSE(thread->Call([] { throw std::runtime_error("spilled ink"); }));
-    EXPECT_EQ(log.Count(ANDROID_LOG_ERROR, "spilled ink"), 1);
-    log.Clear();
-    EXPECT_TRUE(thread->Call([] {}));
 }
 
 // The renderer collects until it is flushed, so a frame is complete only because running empty flushes.

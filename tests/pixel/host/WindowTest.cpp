@@ -5,6 +5,7 @@
 #include "moka/graphics/MokaGraphics.h"
 #include "moka/host/RenderThread.h"
 #include "tests/pixel/host/XWindow.h"
+#include "tests/support/Awaited.h"
 #include "tests/support/LogCapture.h"
 
 #include <gmock/gmock.h>
@@ -136,20 +137,20 @@ TEST_F(WindowTest, APresentWaitsForTheOldestOnceAsManyAreOnTheirWayAsMayBe) {
         ASSERT_TRUE(thread) << error;
         EXPECT_EQ(theInterval, 0);
         std::promise<void> gate = Hold();
-        std::atomic<int> presented{0};
+        Awaited<int> presented;
         std::thread presenter([&] {
             for (int i = 0; i < 20; ++i) {
                 EXPECT_TRUE(thread->Present());
                 ++presented;
             }
         });
-        while (presented < limit) std::this_thread::yield();
+        presented.AwaitAtLeast(limit);
         std::this_thread::sleep_for(milliseconds(50));
-        EXPECT_EQ(presented, limit);
+        EXPECT_EQ(presented.Get(), limit);
         gate.set_value();
         presenter.join();
         holder.join();
-        EXPECT_EQ(presented, 20);
+        EXPECT_EQ(presented.Get(), 20);
         // It would wait for itself.
         thread->Call([&] {
             for (int i = 0; i < 20; ++i) EXPECT_TRUE(thread->Present());

@@ -1,5 +1,6 @@
 // The pen canvas around real foreign GL: the ink lies where its matrix and clip say, and whatever the foreign
 // code leaves behind, the library's own draws before and after it are right.
+#include "apps/moka/PenStroke.h"
 #include "moka/base/RefPtr.h"
 #include "moka/base/log/AndroidLog.h"
 #include "moka/graphics/bitmap/IMKBitmap.h"
@@ -10,6 +11,7 @@
 #include "moka/graphics/paint/MKPaint.h"
 #include "moka/host/RenderThread.h"
 #include "moka/renderer/RendererFactory.h"
+#include "scenes/SceneRenderer.h"
 #include "tests/pixel/pen/ForeignInk.h"
 #include "tests/support/ImageCompare.h"
 #include "tests/support/LogCapture.h"
@@ -146,38 +148,32 @@ TEST_P(PenCanvasPixel, InkIsDrawnInsideTheClipAndNotOutside) {
     EXPECT_EQ(log.GetTexts(ANDROID_LOG_WARN).size(), 0u);
 }
 
-// The bitmap counts as one frame buffer for a pen, and that has no stencil.
-TEST_P(PenCanvasPixel, ATurnedClipAnnouncesItselfAndCutsNothing) {
-    pen->PreRotate(30, 20, 13);
-    pen->SetClipRect(18, 11, 4, 4, C::Intersect);
-    DrawInk(RectF(-100, -100, 100, 100));
-    Picture expected(kWidth, kHeight);
-    FillImage(expected, Rect(0, 0, kWidth, kHeight), kInk);
-    ExpectSame(expected, Read(), "ink under a turned clip");
-    EXPECT_EQ(log.GetTexts(ANDROID_LOG_WARN).size(), 2u);
-
-    // The clip ends with the ink.
-    MKPaint paint;
-    canvas->DrawRect(0, 0, kWidth, 10, &paint);
-    FillImage(expected, Rect(0, 0, kWidth, 10), Color{255, 255, 255, 255});
-    ExpectSame(expected, Read(), "a rectangle after a turned clip");
-}
-
-TEST_P(PenCanvasPixel, TheMatrixMapsAsTheCanvasDoes) {
-    RectF const rect(2, 3, 21, 12);
-    for (C* const each : {static_cast<C*>(pen.Get()), static_cast<C*>(canvas.Get())}) {
-        each->PreTranslate(7.3f, 4.1f);
-        each->PreRotate(21, 10, 9);
-        each->PreScale(1.1f, 0.9f);
-    }
-    MKPaint paint;
-    paint.SetColor(static_cast<int>(0xFF00FF00));
-    canvas->DrawRect(rect, &paint);
-    Picture const drawn = Read();
-    canvas->ClearAll(10 / 255.0f, 20 / 255.0f, 30 / 255.0f, 1);
-    DrawInk(rect);
-    ExpectSame(drawn, Read(), "ink where the canvas draws");
-    EXPECT_GT(CompareImages(drawn, Paper()).differingPixels, 100);
+// Its three panels: whole, cut by two clips, and turned under a clip that replaced another.
+TEST_P(PenCanvasPixel, TheScenesInkFillsItsPanelsAndNothingElse) {
+    Tool::PenStroke stroke(*queue);
+    Picture const picture = RenderScene(*Scenes::FindScene("pen-stroke"), *queue, &stroke);
+    auto const countInk = [&](Rect const& part) {
+        int count = 0;
+        for (int i = part.top * picture.width; i < part.bottom * picture.width; ++i) {
+            bool const isInside = i % picture.width >= part.left && i % picture.width < part.right;
+            if (isInside && picture.GetColor(i % picture.width, i / picture.width)[0] < 100) ++count;
+        }
+        return count;
+    };
+    EXPECT_GT(countInk(Rect(10, 10, 150, 130)), 1000);
+    EXPECT_GT(countInk(Rect(190, 40, 290, 90)), 300);
+    EXPECT_GT(countInk(Rect(360, 25, 440, 115)), 300);
+    for (Rect const& outside :
+         {Rect(151, 0, 189, 140), Rect(291, 0, 359, 140), Rect(190, 0, 480, 24), Rect(441, 0, 480, 140)})
+        EXPECT_EQ(countInk(outside), 0);
+    // External code has ended: draws are joined again.
+    queue->Call([this] {
+        auto const next = NewCanvas(*queue, bitmap, UseFrom::RenderThread);
+        std::uint64_t const before = RendererFactory::GetStatistics().draws;
+        for (float const x : {1.0f, 9.0f}) next->DrawRect(x, 1, x + 5, 5, nullptr);
+        RendererFactory::Flush();
+        EXPECT_EQ(RendererFactory::GetStatistics().draws - before, GetParam() ? 1u : 2u);
+    });
 }
 
 // Each of these takes another way through the renderer: plain, blended, textured, clipped by the scissor,

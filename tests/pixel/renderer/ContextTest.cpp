@@ -48,18 +48,6 @@ TEST_F(ContextTest, LimitsLowerTheDeviceButNeverRaiseIt) {
     EXPECT_EQ(caps->GetMaxTextureSize(), device);
 }
 
-TEST_F(ContextTest, WithoutAContextNothingIsMade) {
-    RendererFactory::DetachContext();
-    RendererFactory::DetachContext();
-    EXPECT_FALSE(MakeTexture(2, 2));
-    EXPECT_FALSE(RendererFactory::CreateRenderTargetFromCurrent(2, 2));
-    EXPECT_FALSE(RendererFactory::CreateRenderTargetFromDefault(2, 2));
-    EXPECT_FALSE(RendererFactory::CreateDepthStencilBuffer(2, 2));
-    RendererFactory::Flush();
-    RendererFactory::InvalidateState();
-    EXPECT_EQ(TakeErrors().size(), 4u);
-}
-
 TEST_F(ContextTest, ObjectsThatOutliveTheirContextAreInertInTheNextOne) {
     TexturePtr texture = MakeTexture(MakeImage(4, 4, kRed));
     TexturePtr elsewhere = MakeTexture(MakeImage(4, 4, kRed));
@@ -119,32 +107,6 @@ TEST_F(ContextTest, DetachingGivesTheHostItsFrameBufferBackAndDeletesWhatWaits) 
     EXPECT_EQ(GetInteger(GL_DRAW_FRAMEBUFFER_BINDING), static_cast<GLint>(host.GetName()));
     RendererStatistics const left = RendererFactory::GetStatistics();
     EXPECT_EQ(left.textures + left.frameBuffers + left.samplers + left.pooledRenderBuffers, 0);
-}
-
-TEST_F(ContextTest, DeferredTheHostGetsItsFrameBufferBackAtTheFlushOnly) {
-    HostFrameBuffer const host(4, 4);
-    glViewport(1, 2, 3, 4);
-    RendererFactory::InvalidateState();
-    RendererFactory::SetDeferred(true);
-    auto const [texture, target] = MakeOffscreen(MakeImage(4, 4));
-    RendererFactory::Flush();
-    std::uint64_t const before = RendererFactory::GetStatistics().frameBufferSwitches;
-    for (int i = 0; i < 10; ++i) {
-        target->Activate();
-        target->Deactivate(false, false);
-        Clear(*target, kRed);
-    }
-    EXPECT_EQ(RendererFactory::GetStatistics().frameBufferSwitches, before);
-    RendererFactory::Flush();
-    // There, and back to the host's.
-    EXPECT_EQ(RendererFactory::GetStatistics().frameBufferSwitches, before + 2);
-    EXPECT_EQ(GetInteger(GL_DRAW_FRAMEBUFFER_BINDING), static_cast<GLint>(host.GetName()));
-    EXPECT_EQ(GetViewport(), (std::vector<GLint>{1, 2, 3, 4}));
-
-    target->Activate();
-    target->Deactivate(false, false);
-    RendererFactory::SetDeferred(false);
-    EXPECT_EQ(GetInteger(GL_DRAW_FRAMEBUFFER_BINDING), static_cast<GLint>(host.GetName()));
 }
 
 #if defined(MOKA_CHECKS) && MOKA_CHECKS

@@ -81,13 +81,15 @@ protected:
     void SetQuad(float l, float t, float r, float b) const {
         float const corners[] = {l, t, l, b, r, t, r, t, l, b, r, b};
         quad->SetVertices(0, corners, 6);
+        quad->SetBounds({l / 4 - 1, t / 4 - 1, r / 4 - 1, b / 4 - 1});
     }
-    void Fill(Color color, float l, float t, float r, float b) const {
+    void Fill(Color color, float l, float t, float r, float b) const { Fill(*colored, color, l, t, r, b); }
+    void Fill(Brush const& brush, Color color, float l, float t, float r, float b) const {
         std::array<float, 4> const value{
             static_cast<float>(color[0]) / 255, static_cast<float>(color[1]) / 255,
             static_cast<float>(color[2]) / 255, static_cast<float>(color[3]) / 255};
-        colored->program->MakeCurrent();
-        colored->parameter->Set(value.data());
+        brush.program->MakeCurrent();
+        brush.parameter->Set(value.data());
         SetQuad(l, t, r, b);
         EXPECT_TRUE(quad->Draw(0, -1, 1));
     }

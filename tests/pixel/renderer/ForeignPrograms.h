@@ -92,17 +92,6 @@ inline constexpr Texts kForeign[] = {
     {"a name that GLSL ES 3.00 reserves", MOKA_PLAIN,
      "precision highp float; uniform vec4 color; void main() { vec4 centroid = color; gl_FragColor = "
      "centroid; }"},
-    {"another one", MOKA_PLAIN,
-     "precision highp float; uniform vec4 color; float smooth() { return 0.5; }"
-     "void main() { gl_FragColor = color * smooth(); }"},
-    {"a variable that hides what texture2D becomes", MOKA_PLAIN,
-     "precision highp float; uniform vec4 color; uniform sampler2D texel;"
-     "void main() { float texture = 0.5; gl_FragColor = texture2D(texel, vec2(texture)) * color; }"},
-    {"a choice of precision", MOKA_PLAIN,
-     "#ifdef GL_FRAGMENT_PRECISION_HIGH\nprecision highp float;\n#else\nprecision mediump float;\n#endif\n"
-     "uniform vec4 color; void main() { gl_FragColor = color; }"},
-    {"gl_FragData", MOKA_PLAIN,
-     "precision highp float; uniform vec4 color; void main() { gl_FragData[0] = color; }"},
     {"a macro that declares", MOKA_PLAIN,
      "#define INPUT uniform\nprecision highp float; INPUT vec4 color; void main() { gl_FragColor = color; }"},
 };

@@ -180,30 +180,6 @@ TEST_F(MergedProgramsTest, AFullBlockIsOneCallAndWhatIsLeftAnother) {
     }
 }
 
-// Two runs in one submission, of which neither begins where the vertices or the records do.
-TEST_F(MergedProgramsTest, RunsBehindOthersFindTheirOwnValues) {
-    auto const draw = [this] {
-        MakeProgram(kWide);
-        ProgramPtr const other(RendererFactory::CreateShaderProgram(kPlain.vertex, kPlain.fragment, "other"));
-        image.target->Activate();
-        for (int i = 0; i < 200; ++i) {
-            ProgramPtr const& now = i < 40 || i >= 100 ? program : other;
-            now->MakeCurrent();
-            SetValues(i);
-            float const color[] = {static_cast<float>(i % 16) / 15, 1, 0, 1};
-            if (now == other) ParameterPtr(other->GetParameter("color"))->Set(color);
-            DrawCell(i);
-        }
-        RendererFactory::Flush();
-        return ReadTarget();
-    };
-    Begin(false);
-    Picture const expected = draw();
-    Begin(true);
-    EXPECT_EQ(FindDifference(draw(), expected), 0);
-    EXPECT_EQ(RendererFactory::GetStatistics().draws, 3u);
-}
-
 TEST_F(MergedProgramsTest, AShortRunIsMergedAtItsSecondSightAndAtMostFourProgramsInAFlush) {
     Begin(true);
     MakeProgram(kPlain);
@@ -245,17 +221,6 @@ TEST_F(MergedProgramsTest, AProgramHasSixteenVariantsAtMostAndTakesThemWithIt) {
     EXPECT_EQ(RendererFactory::GetStatistics().variants, 0);
 }
 
-TEST_F(MergedProgramsTest, OneThatIsReleasedWhileItsDrawsWaitIsDrawnAllTheSame) {
-    Picture const expected = DrawOneByOne(kWide, 60);
-    Begin(true);
-    MakeProgram(kWide);
-    DrawCells(60);
-    program.reset();
-    EXPECT_EQ(Flush(), 1);
-    EXPECT_EQ(FindDifference(ReadTarget(), expected), 0);
-    EXPECT_EQ(RendererFactory::GetStatistics().variants, 0);
-}
-
 TEST_F(MergedProgramsTest, ValuesThatAreNoNumbersDoNotReachOtherDraws) {
     auto const draw = [this](bool merges) {
         Begin(merges);
@@ -282,22 +247,6 @@ TEST_F(MergedProgramsTest, ValuesThatAreNoNumbersDoNotReachOtherDraws) {
         int const y = i / kColumns * kCell + 1;
         EXPECT_EQ(merged.GetColor(x, y), expected.GetColor(x, y)) << i;
     }
-}
-
-TEST_F(MergedProgramsTest, AFlushLeavesTheHostsUniformBufferBound) {
-    Begin(true);
-    MakeProgram(kPlain);
-    GLuint hosts = 0;
-    glGenBuffers(1, &hosts);
-    glBindBuffer(GL_UNIFORM_BUFFER, hosts);
-    RendererFactory::InvalidateState();
-    for (int i = 0; i < 2; ++i) {
-        DrawCells(40);
-        EXPECT_EQ(Flush(), 1);
-        EXPECT_EQ(GetInteger(GL_UNIFORM_BUFFER_BINDING), static_cast<GLint>(hosts));
-    }
-    glDeleteBuffers(1, &hosts);
-    RendererFactory::InvalidateState();
 }
 
 // Edges that pass through the centres of pixels: the last bit of a position decides over each.

@@ -152,61 +152,6 @@ TEST_F(ProgramTest, RemovedAndUnknownParametersAreHarmlessHandlesAndUnknownTypes
     EXPECT_EQ(Draw(), kGreen);
 }
 
-TEST_F(ProgramTest, AValueIsSentOnceWhicheverHandleSetsIt) {
-    ProgramPtr const program = MakeProgram(kVertex, kUniformColor);
-    GLuint const name = MakeCurrent(program);
-    GLint const location = glGetUniformLocation(name, "color");
-    ParameterPtr const first = Find(program, "color");
-    ParameterPtr const second = Find(program, "color");
-    auto const valueInGl = [&] {
-        GLfloat value[4] = {};
-        glGetUniformfv(name, location, value);
-        return value[0];
-    };
-    glUniform4f(location, 0.25f, 0, 0, 0); // shows who overwrites it
-    Set(first, Numbers{0, 0, 0, 0});       // what it is from the beginning
-    EXPECT_EQ(valueInGl(), 0.25f);
-    Set(first, Numbers{1, 0, 0, 1});
-    EXPECT_EQ(valueInGl(), 1.0f);
-    glUniform4f(location, 0.25f, 0, 0, 0);
-    Set(second, Numbers{1, 0, 0, 1});
-    EXPECT_EQ(valueInGl(), 0.25f);
-    Set(second, Numbers{1, 0, 0, 0});
-    EXPECT_EQ(valueInGl(), 1.0f);
-    Set(first, Numbers{1, 0, 0, 1});
-    EXPECT_EQ(Draw(), kRed);
-}
-
-TEST_F(ProgramTest, ValuesBelongToTheirProgramWhicheverIsCurrent) {
-    ProgramPtr const one = MakeProgram(kVertex, kUniformColor);
-    ProgramPtr const other = MakeProgram(kVertex, kUniformColor);
-    ParameterPtr const oneColor = Find(one, "color");
-    ParameterPtr const otherColor = Find(other, "color");
-    Set(oneColor, Numbers{1, 0, 0, 1}); // before any is current
-    other->MakeCurrent();
-    Set(oneColor, Numbers{0, 0, 1, 1});
-    Set(otherColor, Numbers{0, 1, 0, 1});
-    EXPECT_EQ(Draw(), kGreen);
-    one->MakeCurrent();
-    EXPECT_EQ(Draw(), kBlue);
-}
-
-TEST_F(ProgramTest, TheCurrentProgramIsMadeCurrentAgainOnlyAfterForeignGl) {
-    ProgramPtr const program = MakeProgram(kVertex, kUniformColor);
-    GLuint const name = MakeCurrent(program);
-    glUseProgram(0);
-    program->MakeCurrent();
-    EXPECT_EQ(GetInteger(GL_CURRENT_PROGRAM), 0);
-    RendererFactory::InvalidateState();
-    program->MakeCurrent();
-    EXPECT_EQ(GetInteger(GL_CURRENT_PROGRAM), static_cast<GLint>(name));
-    // Without an active target the host may have called GL at any time.
-    mImage.target->Deactivate(false, false);
-    glUseProgram(0);
-    program->MakeCurrent();
-    EXPECT_EQ(GetInteger(GL_CURRENT_PROGRAM), static_cast<GLint>(name));
-}
-
 TEST_F(ProgramTest, SourcesThatDoNotCompileOrLinkMakeAProgramThatDrawsNothing) {
     struct {
         char const* vertex;

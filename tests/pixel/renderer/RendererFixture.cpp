@@ -165,40 +165,6 @@ void DrawRawStrip(std::initializer_list<RawAttribute> attributes) {
     while (location > 0) glDisableVertexAttribArray(--location);
 }
 
-RawQuad::RawQuad(char const* fragment) {
-    std::string const vertexText =
-        "#version 300 es\n"
-        "in vec2 corner; out highp vec2 at;\n"
-        "void main() { at = corner; gl_Position = vec4(corner * 2.0 - 1.0, 0, 1); }";
-    std::string const fragmentText = std::string("#version 300 es\n"
-                                                 "precision highp float; in highp vec2 at; out vec4 color;\n"
-                                                 "uniform highp sampler2D texel;\n"
-                                                 "void main() { ") +
-                                     fragment + " }";
-    mProgram = glCreateProgram();
-    for (auto const& [kind, text] : {std::pair<GLenum, std::string const*>{GL_VERTEX_SHADER, &vertexText},
-                                     {GL_FRAGMENT_SHADER, &fragmentText}}) {
-        GLuint const shader = glCreateShader(kind);
-        char const* const source = text->c_str();
-        glShaderSource(shader, 1, &source, nullptr);
-        glCompileShader(shader);
-        glAttachShader(mProgram, shader);
-        glDeleteShader(shader);
-    }
-    glBindAttribLocation(mProgram, 0, "corner");
-    glLinkProgram(mProgram);
-    GLint linked = GL_FALSE;
-    glGetProgramiv(mProgram, GL_LINK_STATUS, &linked);
-    EXPECT_EQ(linked, GL_TRUE) << fragment;
-}
-
-RawQuad::~RawQuad() { glDeleteProgram(mProgram); }
-
-void RawQuad::Draw() const {
-    glUseProgram(mProgram);
-    DrawRawStrip({{2, {0, 0, 1, 0, 0, 1, 1, 1}}}); // counter-clockwise, so that the front is seen
-}
-
 GLint GetInteger(GLenum name) {
     GLint value = 0;
     glGetIntegerv(name, &value);
@@ -209,12 +175,6 @@ std::vector<GLint> GetViewport() {
     std::vector<GLint> viewport(4);
     glGetIntegerv(GL_VIEWPORT, viewport.data());
     return viewport;
-}
-
-ColorMask GetColorMask() {
-    ColorMask mask;
-    glGetBooleanv(GL_COLOR_WRITEMASK, mask.data());
-    return mask;
 }
 
 } // namespace Moka::Testing

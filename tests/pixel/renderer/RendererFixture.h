@@ -118,26 +118,8 @@ struct RawAttribute {
 // memory; the n-th attribute feeds location n.
 void DrawRawStrip(std::initializer_list<RawAttribute> attributes);
 
-// Draws a quad over the whole viewport with raw GL.
-class RawQuad {
-public:
-    // fragment: the body of main(), which writes "color"; "texel" is the sampler, "at" runs from (0, 0) to
-    // (1, 1).
-    explicit RawQuad(char const* fragment);
-    ~RawQuad();
-    RawQuad(RawQuad const&) = delete;
-    RawQuad& operator=(RawQuad const&) = delete;
-
-    void Draw() const;
-
-private:
-    GLuint mProgram = 0;
-};
-
 GLint GetInteger(GLenum name);
 std::vector<GLint> GetViewport();
-using ColorMask = std::array<GLboolean, 4>;
-ColorMask GetColorMask();
 
 // For tests with deferral and without.
 inline std::string GetDrawMode(::testing::TestParamInfo<bool> const& mode) {

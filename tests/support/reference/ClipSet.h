@@ -20,7 +20,6 @@ class ClipSet {
 public:
     ClipSet(std::vector<ClipEntry> const& entries, int targetHeight);
 
-    bool IsEverything() const { return mKind == Kind::Everything; }
     bool IsPointSet() const { return mKind == Kind::Points; }
     // The pixel for straight clips, the point in target pixels for the others.
     bool Contains(int pixelX, int pixelY, PointD const& point) const;

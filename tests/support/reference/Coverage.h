@@ -3,10 +3,12 @@
 #pragma once
 
 #include "moka/base/Rect.h"
+#include "moka/graphics/canvas/MKPaint.h"
 #include "tests/support/reference/Plane.h"
 
 #include <functional>
 #include <optional>
+#include <vector>
 
 namespace Moka::Testing {
 
@@ -38,5 +40,12 @@ Shape StrokedCircle(PointD const& center, double radius, double width);
 
 // Soft along the sides, cut at the ends.
 Shape SimpleLine(PointD const& from, PointD const& to, double width, bool antiAliased);
+// With caps and dashes.
+Shape Line(PointD const& from, PointD const& to, MKPaint const& paint);
+
+// With elliptic corners, in the pieces they are defined in: straight parts and corners, which meet without a gap
+// and, under a stroke thicker than the radii, lie over each other.
+std::vector<Shape> FilledRoundRect(RectF const& r, double rx, double ry);
+std::vector<Shape> StrokedRoundRect(RectF const& r, double rx, double ry, double width);
 
 } // namespace Moka::Testing

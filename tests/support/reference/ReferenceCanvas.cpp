@@ -1,9 +1,6 @@
 // The canvas's state, and its shapes; ReferenceCanvasBitmaps.cpp draws the bitmaps.
 #include "tests/support/reference/ReferenceCanvas.h"
 
-#include "tests/support/reference/LineCoverage.h"
-#include "tests/support/reference/RoundRectCoverage.h"
-
 #include <algorithm>
 #include <cmath>
 

@@ -1,4 +1,4 @@
-#include "tests/support/reference/RoundRectCoverage.h"
+#include "tests/support/reference/Coverage.h"
 
 #include <algorithm>
 #include <cmath>

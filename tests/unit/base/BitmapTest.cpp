@@ -17,28 +17,6 @@ unsigned char* NewPixels(int bytes) {
     return pixels;
 }
 
-TEST(BitmapTest, FreesTheBufferWithArrayDeleteOnlyWhileTheSwitchIsOn) {
-    struct Case {
-        bool constructWith;
-        bool switchedTo;
-        int deletes;
-    };
-    for (Case const& c : {Case{true, true, 1}, Case{true, false, 0}, Case{false, true, 1}}) {
-        unsigned char* const pixels = NewPixels(2 * 3 * 4);
-        Testing::DeleteWatch const watch(pixels);
-        {
-            Bitmap bitmap;
-            ASSERT_TRUE(bitmap.Construct(pixels, 2, 3, 8, 1, false, c.constructWith));
-            EXPECT_EQ(bitmap.GetDeleteBuffer(), c.constructWith);
-            EXPECT_EQ(bitmap.GetBuffer(), pixels);
-            bitmap.SetDeleteBuffer(c.switchedTo);
-        }
-        EXPECT_EQ(watch.GetArrayDeletes(), c.deletes);
-        EXPECT_EQ(watch.GetPlainDeletes(), 0);
-        if (c.deletes == 0) delete[] pixels;
-    }
-}
-
 TEST(BitmapTest, CopyIsOwnedAndTightAndLeavesTheSourceToTheCaller) {
     // Two rows at stride 12; the buffer ends with the last pixel, not with a whole stride.
     std::unique_ptr<unsigned char[]> const pixels(NewPixels(12 + 8));

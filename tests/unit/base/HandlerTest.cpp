@@ -13,7 +13,6 @@
 #include <functional>
 #include <memory>
 #include <optional>
-#include <stdexcept>
 #include <thread>
 #include <vector>
 
@@ -129,20 +128,6 @@ TEST_F(HandlerTest, RunPendingLeavesWhatIsSentMeanwhile) {
     EXPECT_THAT(receiver.GetReceived(), ElementsAre(1, 3, 11, 13));
 }
 
-TEST_F(HandlerTest, AMessageMayRunTheLoopAndAnInnerOneMayDestroyTheOuterHandler) {
-    MessageLoop loop;
-    Receiver* outer = nullptr;
-    Receiver const inner([&](Handler*, int) { outer->DestroyHandler(); });
-    std::vector<int> counts;
-    Receiver receiver([&](Handler*, int) { counts.push_back(loop.RunPending()); });
-    outer = &receiver;
-    receiver->SendMessage();
-    inner->SendMessage();
-    receiver->SendMessage();
-    EXPECT_EQ(loop.RunPending(), 1) << "the other one ran inside the first";
-    EXPECT_THAT(counts, ElementsAre(1));
-}
-
 TEST_F(HandlerTest, QuitEndsTheRunningOrTheNextRun) {
     MessageLoop loop;
     Receiver const receiver([&](Handler*, int what) {
@@ -157,34 +142,6 @@ TEST_F(HandlerTest, QuitEndsTheRunningOrTheNextRun) {
     loop.Run();
     EXPECT_THAT(receiver.GetReceived(), ElementsAre(0, 1));
     EXPECT_EQ(loop.RunPending(), 1) << "what it left can still run";
-}
-
-TEST_F(HandlerTest, AThrowingMessageIsOneErrorLine) {
-    MessageLoop loop;
-    Receiver const receiver([](Handler*, int what) {
-        if (what == 1) throw std::runtime_error("no paper");
-        if (what == 2) throw 2;
-    });
-    for (int what = 1; what <= 3; ++what) receiver->SendMessage(what);
-    EXPECT_EQ(loop.RunPending(), 3);
-    ASSERT_EQ(log.GetLines().size(), 2U);
-    EXPECT_NE(log.GetTexts()[0].find("no paper"), std::string::npos);
-}
-
-TEST_F(HandlerTest, WithoutMemoryMessagesAreRefused) {
-    MessageLoop loop;
-    Receiver const receiver;
-    int sent = 0;
-    std::optional<Handler> handler;
-    {
-        Testing::FailAllocations const fail;
-        handler.emplace([](Handler*, void*, int) {}, nullptr);
-        while (receiver->SendMessage(sent)) ++sent; // the queue has room for some
-    }
-    EXPECT_FALSE(handler->SendMessage());
-    EXPECT_EQ(loop.RunPending(), sent);
-    EXPECT_TRUE(receiver->SendMessage(-1));
-    EXPECT_EQ(loop.RunPending(), 1);
 }
 
 // A loop on a thread of its own, running until the object goes.
@@ -269,26 +226,6 @@ TEST_F(HandlerTest, DestructionElsewhereWaitsForTheRunningMessage) {
     EXPECT_TRUE(refused);
     loop.Stop();
     EXPECT_THAT(receiver->GetReceived(), ElementsAre(0));
-}
-
-// The message can destroy the handler while the sender is still inside SendMessage.
-TEST_F(HandlerTest, HandlersMayComeAndGoWhileTheLoopIsBusy) {
-    for (int round = 0; round < 600; ++round) {
-        Awaited<bool> done;
-        std::unique_ptr<Receiver> receiver;
-        LoopThread loop([&] {
-            receiver = std::make_unique<Receiver>([&](Handler*, int what) {
-                if (what < 0) receiver->DestroyHandler();
-                done.Set(true);
-            });
-        });
-        bool const isDestroyedByMessage = round % 2 == 0;
-        for (int i = 0; i < (isDestroyedByMessage ? 1 : 20); ++i)
-            (*receiver)->SendMessage(isDestroyedByMessage ? -1 : i);
-        done.AwaitAtLeast(true);
-        if (round % 3 == 0) loop.Stop(); // the loop goes first
-        receiver.reset();                // a message that still ran would touch it
-    }
 }
 
 } // namespace

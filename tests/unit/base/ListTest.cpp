@@ -78,28 +78,5 @@ TEST(ListTest, AQueueInSteadyUseKeepsItsStorageAndDrainsWithoutAllocating) {
     EXPECT_EQ(Testing::GetAllocationCount(), warm);
 }
 
-TEST(ListTest, RefusesAnItemItHasNoMemoryForAndKeepsTheRest) {
-    int first = 0;
-    int second = 0;
-    int const before = Testing::GetAllocationCount();
-    List<int> list;
-    EXPECT_EQ(Testing::GetAllocationCount(), before) << "an empty list allocates nothing";
-    bool added = true;
-    {
-        Testing::FailAllocations const fail;
-        added = list.Add(&first);
-    }
-    EXPECT_FALSE(added);
-    ASSERT_TRUE(list.Add(&first));
-    int accepted = 0;
-    {
-        Testing::FailAllocations const fail;
-        while (list.Add(&second)) ++accepted; // until the storage it has is full
-    }
-    EXPECT_EQ(list.GetCount(), 1 + accepted);
-    EXPECT_EQ(list.GetAt(0), &first);
-    EXPECT_TRUE(list.Add(&second));
-}
-
 } // namespace
 } // namespace Moka

@@ -66,18 +66,6 @@ protected:
     std::vector<LogLine> mLines;
 };
 
-TEST_F(LogTest, TheSinkSeesEveryPartInsteadOfStderr) {
-    Collect();
-    SetLogPriority(ANDROID_LOG_ERROR); // only stderr is filtered
-    EXPECT_EQ(__android_log_print(ANDROID_LOG_DEBUG, "tag", "%d of %s", 3, "four"), 9);
-    ASSERT_EQ(mLines.size(), 1U);
-    EXPECT_EQ(mLines[0].priority, ANDROID_LOG_DEBUG);
-    EXPECT_EQ(mLines[0].tag, "tag");
-    EXPECT_EQ(mLines[0].format, "%d of %s");
-    EXPECT_EQ(mLines[0].text, "3 of four");
-    EXPECT_TRUE(mStderr.Take().empty());
-}
-
 TEST_F(LogTest, WritesEachLineInOnePieceToStderrFromTheLowestPriorityOn) {
     std::string const text(50'000, 'x');
     EXPECT_EQ(__android_log_print(ANDROID_LOG_DEBUG, "t", "hidden"), 0);

@@ -13,22 +13,14 @@ constexpr int kMax = std::numeric_limits<int>::max();
 constexpr float kNan = std::numeric_limits<float>::quiet_NaN();
 constexpr float kInf = std::numeric_limits<float>::infinity();
 
-TEST(RectTest, SizesAreSaturated) {
+TEST(RectTest, SizesAreSaturatedAndContainsIsHalfOpen) {
     EXPECT_EQ(Rect(kMin, 5, kMax, 2).GetWidth(), kMax);
-    EXPECT_EQ(Rect(kMin, 5, kMax, 2).GetHeight(), -3);
-    EXPECT_EQ(Rect(-3, 1, 4, kMin).GetWidth(), 7);
     EXPECT_EQ(Rect(-3, 1, 4, kMin).GetHeight(), kMin);
-    EXPECT_FALSE(Rect(kMin, kMin, kMax, kMax).IsEmpty());
     for (Rect const& r : {Rect(kMax, 0, kMin, 1), Rect(0, 0, 0, 5), Rect(0, 0, 5, 0)})
         EXPECT_TRUE(r.IsEmpty());
-}
-
-TEST(RectTest, ContainsIsHalfOpen) {
     Rect const r(-1, 2, 3, 4);
     for (Point const& p : {Point(-1, 2), Point(2, 3)}) EXPECT_TRUE(r.Contains(p));
     for (Point const& p : {Point(3, 3), Point(2, 4), Point(-2, 2), Point(-1, 1)}) EXPECT_FALSE(r.Contains(p));
-    EXPECT_TRUE(Rect(kMin, kMin, kMax, kMax).Contains({kMin, kMax - 1}));
-    EXPECT_FALSE(Rect(3, 4, -1, 2).Contains({0, 3}));
 }
 
 TEST(RectTest, IntersectIsExactlyTheSharedPixels) {
@@ -63,69 +55,16 @@ TEST(RectTest, ConversionEnclosesAndSaturates) {
     EXPECT_EQ(assigned, Rect(-2, 0, 1, 1));
 }
 
-TEST(RectFTest, GrowsFromAPointAndIgnoresNan) {
-    RectF r(3, 4, 3, 4);
-    struct {
-        float x, y;
-        RectF grown;
-    } const steps[] = {{1, 7, {1, 4, 3, 7}},
-                       {2, 5, {1, 4, 3, 7}}, // inside
-                       {9, kNan, {1, 4, 9, 7}},
-                       {kNan, -1, {1, -1, 9, 7}}};
-    for (auto const& [x, y, grown] : steps) {
-        r.MakeRect(x, y);
-        EXPECT_EQ(r, grown) << x << ' ' << y;
-    }
-}
-
-TEST(RectFTest, RoundsOutwardsAndMovesEveryEdge) {
-    RectF r(-0.5f, 0.25f, 1.25f, -0.25f);
-    r.ExtendRect();
-    EXPECT_EQ(r, RectF(-1, 0, 2, 0));
-    r.Set(-kInf, 1e20f, kInf, 2e20f);
-    r.ExtendRect();
-    EXPECT_EQ(r, RectF(-kInf, 1e20f, kInf, 2e20f));
-    r.Set(10, 20, 30, 40);
-    r.IncreaseRect(1, 2);
-    EXPECT_EQ(r, RectF(9, 18, 31, 42));
-    r.IncreaseRect(-11, -2);
-    EXPECT_EQ(r, RectF(20, 20, 20, 40));
-}
-
-TEST(RectFTest, IsEmptyUnlessBothSidesArePositive) {
-    EXPECT_FALSE(RectF(0, 0, 1e-45f, 1e-45f).IsEmpty());
-    EXPECT_FALSE(RectF(-kInf, -kInf, kInf, kInf).IsEmpty());
-    for (RectF const& r : {RectF(0, 0, 0, 1), RectF(0, 0, 1, 0), RectF(1, 0, 0, 1), RectF(kNan, 0, 1, 1),
-                           RectF(0, kNan, 1, 1), RectF(0, 0, kNan, 1), RectF(0, 0, 1, kNan)}) {
-        EXPECT_TRUE(r.IsEmpty());
-    }
-}
-
-// Said in terms of points: a line's extent is the one point it lies on, which meets a closed range; two
-// ranges with an extent must share more than a point.
-bool MeetOnAxis(float lowA, float highA, float lowB, float highB) {
-    if (lowA == highA) return lowB <= lowA && lowA <= highB;
-    if (lowB == highB) return lowA <= lowB && lowB <= highA;
-    return lowA < highB && lowB < highA;
-}
-
 TEST(RectFTest, IsIntersectCountsLinesAndNotSharedEdges) {
-    std::vector<float> const edges{-kInf, -1, -0.0f, 0, 0.5f, 1, kInf};
-    std::vector<std::pair<float, float>> extents;
-    for (float const low : edges)
-        for (float const high : edges)
-            if (low <= high) extents.emplace_back(low, high);
-    for (auto const& [lowA, highA] : extents) {
-        for (auto const& [lowB, highB] : extents) {
-            bool const meet = MeetOnAxis(lowA, highA, lowB, highB);
-            // The other axis certainly overlaps, or certainly does not.
-            EXPECT_EQ(RectF(lowA, 0, highA, 2).IsIntersect(RectF(lowB, 1, highB, 3)), meet)
-                << lowA << ' ' << highA << " / " << lowB << ' ' << highB;
-            EXPECT_EQ(RectF(0, lowA, 2, highA).IsIntersect(RectF(1, lowB, 3, highB)), meet);
-            EXPECT_FALSE(RectF(lowA, 0, highA, 1).IsIntersect(RectF(lowB, 2, highB, 3)));
-            for (RectF const& broken : {RectF(kNan, 1, highB, 3), RectF(lowB, 1, kNan, 3)})
-                EXPECT_FALSE(RectF(lowA, 0, highA, 2).IsIntersect(broken));
-        }
+    struct {
+        float low, high; // held against 0 to 1
+        bool meets;
+    } const cases[] = {{-1, 0, false}, {-1, 0.5f, true}, {1, 2, false},
+                       {0, 0, true},   {1, 1, true},     {-kInf, kInf, true},
+                       {2, 2, false},  {kNan, 2, false}, {-1, kNan, false}};
+    for (auto const& [low, high, meets] : cases) {
+        EXPECT_EQ(RectF(low, 0, high, 2).IsIntersect(RectF(0, 1, 1, 3)), meets) << low << ' ' << high;
+        EXPECT_EQ(RectF(1, 0, 3, 1).IsIntersect(RectF(0, low, 2, high)), meets) << low << ' ' << high;
     }
 }
 

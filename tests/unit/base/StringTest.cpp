@@ -31,16 +31,6 @@ TEST(StringTest, EveryCodePointSurvivesTheRoundTrip) {
     EXPECT_EQ(FromUnits(u"aä€\U0001f600").ToUtf8(), "a\xc3\xa4\xe2\x82\xac\xf0\x9f\x98\x80");
 }
 
-TEST(StringTest, LoneSurrogatesBecomeReplacements) {
-    for (int unit = 0xd800; unit <= 0xdfff; ++unit) {
-        auto const lone = static_cast<char16_t>(unit);
-        ASSERT_EQ(FromUnits({lone}).ToUtf8(), "\xef\xbf\xbd");
-        ASSERT_EQ(FromUnits({lone, u'x'}).ToUtf8(), "\xef\xbf\xbdx") << "what follows is kept";
-    }
-    EXPECT_EQ(FromUnits({0xdc00, 0xd800}).ToUtf8(), "\xef\xbf\xbd\xef\xbf\xbd");
-    EXPECT_EQ(FromUnits({0xd800, 0xd83d, 0xde00}).ToUtf8(), "\xef\xbf\xbd\xf0\x9f\x98\x80");
-}
-
 TEST(StringTest, MalformedUtf8BecomesReplacementsAndTheRestIsKept) {
     struct {
         char const* what;
@@ -92,17 +82,6 @@ TEST(StringTest, BufferConversionCutsAtACharacterAndTerminates) {
     EXPECT_EQ(byte, '\0');
 }
 
-TEST(StringTest, EmptyAndNullSources) {
-    EXPECT_TRUE(String().IsEmpty());
-    EXPECT_EQ(*String().GetPointer(), u'\0');
-    EXPECT_TRUE(String(static_cast<char const*>(nullptr)).IsEmpty());
-    EXPECT_TRUE(String(nullptr, 5).IsEmpty());
-    EXPECT_TRUE(String(u"abc", -1).IsEmpty());
-    String const zeros(std::string("a\0b", 3));
-    EXPECT_EQ(zeros.GetLength(), 3);
-    EXPECT_EQ(zeros.ToUtf8(), std::string("a\0b", 3));
-}
-
 TEST(StringTest, SubStringStaysInsideAndLeavesTheResultOnRefusal) {
     String const text("picture.PNG");
     String result("before");
@@ -126,15 +105,6 @@ TEST(StringTest, SubStringStaysInsideAndLeavesTheResultOnRefusal) {
 TEST(StringTest, FindsTheLastOccurrence) {
     std::pair<char const*, int> const cases[] = {{".", 5}, {"ar", 3}, {"a.t", 0}, {"/", -1}, {"", 8}};
     for (auto const& [part, at] : cases) EXPECT_EQ(String("a.tar.gz").ReverseFind(part), at) << part;
-}
-
-TEST(StringTest, ComparesByUnitAndByCase) {
-    EXPECT_EQ(String("png"), String("png"));
-    EXPECT_GT(String("png").CompareTo("PNG"), 0);
-    EXPECT_LT(String("PNG").CompareTo("png"), 0);
-    EXPECT_LT(String("pn").CompareTo("png"), 0);
-    EXPECT_GT(FromUnits(u"\uff00").CompareTo(FromUnits(u"a")), 0) << "units are unsigned";
-    EXPECT_NE(String("png"), String("PNG"));
 }
 
 } // namespace

@@ -3,22 +3,18 @@
 #include "moka/base/ConditionalVariable.h"
 #include "moka/base/CriticalSection.h"
 #include "moka/base/RefCount.h"
-#include "moka/base/RefPtr.h"
 
 #include "tests/support/Awaited.h"
 #include "tests/support/LogCapture.h"
 
 #include <gtest/gtest.h>
 
-#include <algorithm>
 #include <chrono>
 #include <string>
 #include <thread>
 #include <vector>
 
 #include <pthread.h>
-#include <sys/resource.h>
-#include <unistd.h>
 
 namespace Moka {
 namespace {
@@ -27,11 +23,8 @@ using namespace std::chrono_literals;
 using Clock = std::chrono::steady_clock;
 using Testing::Awaited;
 
-int GetPriority() { return getpriority(PRIO_PROCESS, static_cast<id_t>(gettid())); }
-
 struct Seen {
     std::string name;
-    int priority = 0;
     bool done = false; // not atomic: joining is what makes it visible
 };
 
@@ -40,22 +33,8 @@ void Look(void* argument) {
     char name[64] = {};
     pthread_getname_np(pthread_self(), name, sizeof name);
     seen->name = name;
-    seen->priority = GetPriority();
     std::this_thread::sleep_for(5ms);
     seen->done = true;
-}
-
-// What a thread of this name and priority sees, waited for by its destructor.
-Seen LookAround(char const* name, int priority = GetPriority()) {
-    Seen seen;
-    std::string given(name ? name : "");
-    {
-        Thread thread(Look, &seen, name ? given.c_str() : nullptr, priority);
-        given.assign(given.size(), '#'); // the name was copied
-        EXPECT_TRUE(thread.Start());
-    }
-    EXPECT_TRUE(seen.done);
-    return seen;
 }
 
 class ThreadTest : public testing::Test {
@@ -72,19 +51,17 @@ TEST_F(ThreadTest, NamesAreCutAtACharacter) {
         {"1234567890123\xc3\xa4", "1234567890123\xc3\xa4"},
         {"12345678901\xf0\x9f\x98\x80z", "12345678901\xf0\x9f\x98\x80"},
     };
-    for (auto const& [given, got] : cases) EXPECT_EQ(LookAround(given).name, got);
-    LookAround(nullptr);
-}
-
-TEST_F(ThreadTest, PriorityIsItsOwnAndARefusedOneIsIgnored) {
-    constexpr int kLowest = 19;
-    int const own = GetPriority();
-    for (int const refusable : {-20, -1000, 1000}) LookAround("p", refusable);
-    EXPECT_TRUE(log.GetLines().empty());
-    if (own == kLowest) GTEST_SKIP() << "the process has the lowest priority already: there is none below it";
-    int const lower = std::min(own + 3, kLowest);
-    EXPECT_EQ(LookAround("low", lower).priority, lower);
-    EXPECT_EQ(GetPriority(), own);
+    for (auto const& [name, got] : cases) {
+        Seen seen;
+        std::string given(name);
+        {
+            Thread thread(Look, &seen, given.c_str());
+            given.assign(given.size(), '#'); // the name was copied
+            EXPECT_TRUE(thread.Start());
+        } // waits for its end
+        EXPECT_TRUE(seen.done);
+        EXPECT_EQ(seen.name, got);
+    }
 }
 
 TEST_F(ThreadTest, StartsOnceAndJoinsHarmlessly) {
@@ -103,14 +80,13 @@ TEST_F(ThreadTest, StartsOnceAndJoinsHarmlessly) {
     EXPECT_NE(log.GetTexts()[0].find("once"), std::string::npos);
 }
 
-struct SelfDeleting {
-    Thread* thread = nullptr;
-    Awaited<bool> done;
-};
-
 // Often enough that the function at times runs before Start has returned.
 TEST_F(ThreadTest, AFunctionMayDeleteItsOwnThread) {
     constexpr int kRounds = 300;
+    struct SelfDeleting {
+        Thread* thread = nullptr;
+        Awaited<bool> done;
+    };
     for (int i = 0; i < kRounds; ++i) {
         SelfDeleting own;
         own.thread = new Thread(
@@ -206,38 +182,6 @@ TEST(RefCountTest, TheLastUnrefSeesWhatTheOthersDid) {
         for (std::thread& thread : threads) thread.join();
         ASSERT_EQ(sum, static_cast<int>(kThreads));
     }
-}
-
-class Counted : public RefCount {
-public:
-    explicit Counted(int* deleted) : mDeleted(deleted) {}
-    ~Counted() override { ++*mDeleted; }
-
-private:
-    int* mDeleted;
-};
-
-TEST(RefPtrTest, AdoptsSharesMovesAndReleases) {
-    int deleted = 0;
-    {
-        auto adopted = RefPtr<Counted>::Adopt(new Counted(&deleted));
-        EXPECT_EQ(adopted->Ref(), 2);
-        EXPECT_EQ(adopted->Unref(), 1);
-        auto shared = RefPtr<Counted>::Share(adopted.Get());
-        RefPtr<Counted> copy = shared;
-        EXPECT_EQ(adopted->GetRefCount(), 3);
-        RefPtr<Counted> const moved = std::move(copy);
-        RefPtr<Counted>& same = shared;
-        shared = same;
-        EXPECT_EQ(adopted->GetRefCount(), 3);
-        shared = RefPtr<Counted>();
-        Counted* const released = adopted.Release();
-        EXPECT_FALSE(adopted);
-        EXPECT_EQ(released->Unref(), 1);
-        EXPECT_EQ(deleted, 0) << "moved holds it still";
-    }
-    EXPECT_EQ(deleted, 1);
-    EXPECT_FALSE(RefPtr<Counted>::Share(nullptr));
 }
 
 } // namespace

@@ -53,18 +53,6 @@ struct Seen {
     }
 };
 
-// Callbacks that throw.
-struct Thrown {
-    static void OnPixel(unsigned int, void*) { throw Thrown(); }
-    static void OnData(Rect const&, void*, void*) { throw Thrown(); }
-};
-
-// Says at once that it has caught up, as every queue does on its own thread.
-class HastyQueue final : public HandPumpedQueue {
-public:
-    void WaitForTasks() override {}
-};
-
 class BitmapFixture : public ::testing::Test {
 protected:
     static constexpr int kMaxSide = 64;
@@ -76,14 +64,10 @@ protected:
         mAliveBefore = RendererTrace::CountLiveObjects(); // other tests leak on purpose
         RendererTrace::DeclareNoRenderThread();
         RunOnRenderThread(queue);
-        RunOnRenderThread(picky);
-        RunOnRenderThread(hasty);
     }
 
     void TearDown() override {
         queue.RunAll();
-        picky.RunAll();
-        hasty.RunAll();
         EXPECT_EQ(RendererTrace::CountLiveObjects(), mAliveBefore);
         for (std::string const& violation : RendererTrace::GetViolations()) ADD_FAILURE() << violation;
         RendererTrace::DeclareRenderThread();
@@ -100,10 +84,6 @@ protected:
     }
     BitmapPtr NewBitmap(int width, int height, void const* pixels = nullptr) {
         return BitmapPtr::Adopt(Create(width, height, pixels));
-    }
-    BitmapPtr NewPickyBitmap(int width, int height) {
-        return BitmapPtr::Adopt(
-            MKGraphicsFactory::CreateBitmap(&picky, width, height, nullptr, false, 1, false));
     }
     static Pixels ReadAll(BitmapPtr const& bitmap) {
         Rect const r = bitmap->GetBitmapRect();
@@ -128,10 +108,8 @@ protected:
         return texture->GetLabel();
     }
 
-    HandPumpedQueue queue;
-    HastyQueue hasty;
-    bool refuse = false; // what picky does with the next tasks
-    RefusingQueue picky{RefusingQueue::Predicate([this](int, ITask*) { return refuse; })};
+    bool refuse = false; // what the queue does with the next tasks
+    RefusingQueue queue{RefusingQueue::Predicate([this](int, ITask*) { return refuse; })};
 
 private:
     int mAliveBefore = 0;

@@ -10,24 +10,6 @@
 namespace Moka::Testing {
 namespace {
 
-TEST_F(Factory, AnInvalidRequestLogsOneLineAndGivesNothing) {
-    std::string const format = "%s, bitmap is not created!, bitmap width = %d, height = %d, queue=%p";
-    EXPECT_EQ(MKGraphicsFactory::CreateBitmap(&queue, 0, 7, nullptr, false, 1, false), nullptr);
-    EXPECT_EQ(MKGraphicsFactory::CreateBitmap(&queue, 7, -1, nullptr, false, 1, false), nullptr);
-    EXPECT_EQ(MKGraphicsFactory::CreateBitmap(nullptr, 7, 7, nullptr, false, 0, false), nullptr);
-    EXPECT_EQ(MKGraphicsFactory::CreateBitmap(&queue, Rect(0, 0, 1, 1), 0, 7, nullptr, 1), nullptr);
-    auto const lines = log.GetLines();
-    ASSERT_EQ(lines.size(), 4u);
-    for (LogLine const& line : lines) {
-        EXPECT_EQ(line.priority, ANDROID_LOG_ERROR);
-        EXPECT_EQ(line.tag, "mok_log");
-        EXPECT_EQ(line.format, format);
-    }
-    EXPECT_EQ(
-        lines[1].text.find("CreateBitmap, bitmap is not created!, bitmap width = 7, height = -1, queue="),
-        0u);
-}
-
 // useQueue decides who owns the pixels of a region; its strips are caller-side in both cases.
 TEST_F(Factory, ARegionOwnsItsPixelsOnlyWithUseQueueZero) {
     auto const create = [&](Rect const& region, void const* pixels, int useQueue) {
@@ -43,7 +25,14 @@ TEST_F(Factory, ARegionOwnsItsPixelsOnlyWithUseQueueZero) {
     EXPECT_TRUE(log.GetLines().empty());
 }
 
-TEST_F(Factory, AParentMustExistAndHaveTextures) {
+TEST_F(Factory, AnInvalidSizeQueueOrParentIsOneErrorLine) {
+    std::string const size = "CreateBitmap, bitmap is not created!, bitmap width = 7, height = -1, queue=";
+    EXPECT_EQ(MKGraphicsFactory::CreateBitmap(&queue, 7, -1, nullptr, false, 1, false), nullptr);
+    EXPECT_EQ(MKGraphicsFactory::CreateBitmap(nullptr, 7, 7, nullptr, false, 0, false), nullptr);
+    EXPECT_EQ(MKGraphicsFactory::CreateBitmap(&queue, Rect(0, 0, 1, 1), 0, 7, nullptr, 1), nullptr);
+    EXPECT_EQ(log.Count(ANDROID_LOG_ERROR, "bitmap is not created!, bitmap width = "), 3);
+    EXPECT_EQ(log.Count(ANDROID_LOG_ERROR, size), 1);
+    log.Clear();
     EXPECT_EQ(MKGraphicsFactory::CreateBitmap(&queue, static_cast<IMKBitmap*>(nullptr), 1), nullptr);
     auto const screen = BitmapPtr::Adopt(MKGraphicsFactory::CreateScreenBitmap(&queue, 3, 4, 5, 6, 1, 1));
     screen->SetTag("screen");
@@ -87,40 +76,6 @@ TEST_F(Factory, WithoutAQueueWhatIsCallerSideIsNothing) {
     EXPECT_EQ(log.Count(ANDROID_LOG_ERROR, "invalid parent bitmap"), 2) << "the parent is looked at first";
 }
 
-TEST_F(Factory, NullsAreIgnoredWhereTheyMayBe) {
-    MKGraphicsFactory::RefBitmap(nullptr);
-    MKGraphicsFactory::ReleaseBitmap(nullptr);
-    MKGraphicsFactory::RefCanvas(nullptr);
-    MKGraphicsFactory::ReleaseCanvas(nullptr);
-    EXPECT_EQ(MKGraphicsFactory::CreateBitmap(&queue, static_cast<TextureObject const*>(nullptr), 1),
-              nullptr);
-    EXPECT_EQ(MKGraphicsFactory::CreateCanvas(&queue, nullptr, 1), nullptr);
-    EXPECT_EQ(MKGraphicsFactory::CreatePenCanvas(nullptr, nullptr, 0), nullptr);
-    EXPECT_TRUE(log.GetLines().empty());
-    auto const bitmap = NewBitmap(1, 1);
-    MKGraphicsFactory::RefBitmap(bitmap.Get());
-    EXPECT_EQ(CountOf(bitmap.Get()), 2);
-    MKGraphicsFactory::ReleaseBitmap(bitmap.Get());
-}
-
-TEST_F(Factory, TheExtensionIsWhatFollowsTheLastDot) {
-    String extension;
-    auto const of = [&](char const* path) {
-        String const p(path);
-        EXPECT_TRUE(GetExtensionByFile(&p, &extension));
-        return extension.ToUtf8();
-    };
-    EXPECT_EQ(of("a/b.c/photo.tar.mki"), "mki");
-    EXPECT_EQ(of("mki"), "mki") << "without a dot it is the whole path";
-    EXPECT_EQ(of("photo."), "");
-    EXPECT_EQ(of(""), "");
-    String const upper("a.MKI");
-    EXPECT_FALSE(CompareExtensionByFile(&upper, "mki"));
-    EXPECT_TRUE(CompareExtensionByFile(&upper, "MKI"));
-    EXPECT_FALSE(GetExtensionByFile(&upper, nullptr));
-    EXPECT_FALSE(CompareExtensionByFile(nullptr, "mki"));
-}
-
 TEST_F(Factory, FilesOtherThanMkiNeedTheBridge) {
     String const png = Save("a.png", 5, 4);
     String const mki = Save("a.mki", 5, 4);
@@ -151,14 +106,6 @@ TEST_F(Factory, ARegionOfAFileIsDecodedWhateverItsExtensionAndOwnsItsPixelsUntil
     }
     EXPECT_EQ(MKGraphicsFactory::CreateBitmap(&queue, Rect(9, 0, 12, 3), &png, 1), nullptr);
     EXPECT_EQ(MKGraphicsFactory::CreateBitmap(nullptr, Rect(0, 0, 1, 1), &png, 1), nullptr);
-}
-
-TEST_F(Factory, AFileThatCannotBeReadIsNothingAndSaysWhy) {
-    String const missing = Path("missing.mki");
-    EXPECT_EQ(MKGraphicsFactory::CreateBitmap(&queue, &missing, 1), nullptr);
-    EXPECT_EQ(MKGraphicsFactory::CreateBitmap(&queue, Rect(0, 0, 1, 1), &missing, 1), nullptr);
-    EXPECT_EQ(log.Count(ANDROID_LOG_ERROR, "/*******.mki': No such file"), 2);
-    EXPECT_EQ(queue.GetPostedCount(), 0);
 }
 
 } // namespace

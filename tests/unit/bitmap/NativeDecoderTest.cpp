@@ -28,7 +28,7 @@ TEST_F(Factory, TheNativeDecoderOpensEveryFormat) {
               UniquePixels(5, 4));
 }
 
-// One decoded copy from the file to the upload, and none after it.
+// One decoded copy from the file to the upload, and none after it; scaled, only the result.
 TEST_F(Factory, LoadingHoldsOneDecodedCopyUntilItIsUploaded) {
     MKBitmapFactory_UseNativeDecoder();
     constexpr int kWidth = 600;
@@ -49,6 +49,9 @@ TEST_F(Factory, LoadingHoldsOneDecodedCopyUntilItIsUploaded) {
         MKGraphicsFactory::ReleaseBitmap(MKGraphicsFactory::CreateBitmap(&queue, &path, 0));
         EXPECT_EQ(ArrayMemory::GetLive(), before) << name;
         EXPECT_LT(ArrayMemory::GetPeak() - before, kBytes + kBytes / 4) << name;
+        ArrayMemory::ResetPeak();
+        delete MKGraphicsFactory::CreateScaledCPUBitmap(&path, kWidth / 8, kHeight / 8);
+        EXPECT_LT(ArrayMemory::GetPeak() - before, kBytes / 4) << name;
     }
 }
 

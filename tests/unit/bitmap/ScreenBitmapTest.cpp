@@ -1,15 +1,11 @@
 // Screen bitmaps: which frame buffer, which rows, and the references of both flavours.
 #include "moka/base/log/AndroidLog.h"
-#include "moka/graphics/bitmap/MKScreenBitmap.h"
-#include "moka/graphics/bitmap/MKScreenBitmapRT.h"
 #include "tests/support/LogCapture.h"
 #include "tests/unit/bitmap/BitmapFixture.h"
 
 #include <gmock/gmock.h>
 
 #include <algorithm>
-#include <cmath>
-#include <limits>
 
 namespace Moka::Testing {
 namespace {
@@ -51,32 +47,10 @@ TEST_F(ScreenBitmap, StandsForTheFrameBufferAskedForAndClonesForTheOther) {
     auto const clone = BitmapPtr::Adopt(usual->Clone());
     EXPECT_EQ(clone->GetBitmapRect(), Rect(3, 4, 23, 14));
     queue.RunAll();
-    BitmapPtr directClone;
-    {
-        OnRenderThread const here;
-        directClone = BitmapPtr::Adopt(NewScreenRT(3, 4, 20, 10, 0)->Clone());
-    }
-    EXPECT_EQ(queue.GetPendingCount(), 1) << "a clone is caller-side";
-    queue.RunAll();
     std::vector<std::string> created;
     for (TracedCall const& call : RendererTrace::GetCalls())
         if (call.operation == "Create") created.push_back(call.arguments.substr(0, call.arguments.find(' ')));
-    EXPECT_THAT(created, ElementsAre("default", "current", "current", "current", "default"));
-    EXPECT_EQ(CountOf(usual.Get()), 1);
-    EXPECT_EQ(usual->GetBitmapReadable(), nullptr);
-    EXPECT_EQ(usual->GetTextureBitmap(), nullptr);
-    constexpr int kMost = std::numeric_limits<int>::max(); // what lies beyond is cut to it
-    constexpr int kLeast = std::numeric_limits<int>::min();
-    EXPECT_EQ(NewScreen(kMost - 1, kLeast, 20, -2)->GetBitmapRect(), Rect(kMost - 1, kLeast, kMost, kLeast));
-}
-
-TEST_F(ScreenBitmap, TheProjectionTurnsRowsOverAndIgnoresThePlace) {
-    auto const projection = [&](int width, int height) {
-        return NewScreen(3, 4, width, height)->GetBitmapWritable()->GetProjectionMatrix();
-    };
-    EXPECT_EQ(projection(20, 10),
-              Matrix4<float>(0.1f, 0, 0, 0, 0, -0.2f, 0, 0, 0, 0, -1.0f / 32767, 0, -1, 1, -0.0f, 1));
-    EXPECT_TRUE(std::isnan(projection(0, 0)[12]));
+    EXPECT_THAT(created, ElementsAre("default", "current", "current"));
 }
 
 TEST_F(ScreenBitmap, APixelIsReadOneRowOffAndNeverReturnedOnTheCallersSide) {
@@ -142,17 +116,6 @@ TEST_F(ScreenBitmap, ABlockIsReadUnturnedIntoItsPlaceInTheDestination) {
     EXPECT_EQ(read([&] { direct->GetBitmapData(asked, pixels.data()); }), expected);
 }
 
-TEST_F(ScreenBitmap, AThrowingCallbackCostsNoReference) {
-    auto const screen = NewScreen(0, 0, 4, 4);
-    queue.RunAll();
-    unsigned pixels[16];
-    screen->GetPixelAsync(Point(1, 1), nullptr, Thrown::OnPixel);
-    screen->GetBitmapDataAsync(Rect(0, 0, 4, 4), pixels, nullptr, Thrown::OnData);
-    EXPECT_THROW(queue.RunOne(), Thrown);
-    EXPECT_THROW(queue.RunOne(), Thrown);
-    EXPECT_EQ(CountOf(screen.Get()), 1);
-}
-
 TEST_F(ScreenBitmap, ActivationIsPostedDeactivationIsNotAndAttachingOnlyCounts) {
     auto const screen = NewScreen(0, 0, 20, 10);
     IMKBitmapWritable* const writable = screen->GetBitmapWritable();
@@ -186,61 +149,6 @@ TEST_F(ScreenBitmap, ActivationIsPostedDeactivationIsNotAndAttachingOnlyCounts) 
     std::vector<std::string> const calls = RendererTrace::TakeCalls();
     EXPECT_THAT(calls, Contains("target 1 Deactivate 0 1"));
     EXPECT_THAT(calls, Contains("target 2 Deactivate 1 0"));
-}
-
-template <class Screen>
-struct MyScreen : Screen {
-    using Screen::Screen;
-    void ActivateFrameBufferRT(bool release) override {
-        ++activations;
-        Screen::ActivateFrameBufferRT(release);
-    }
-    int activations = 0;
-};
-
-TEST_F(ScreenBitmap, ItsTasksReachTheOverridesOfADerivedClass) {
-    auto const posted = RefPtr<MyScreen<MKScreenBitmap>>::Adopt(
-        new MyScreen<MKScreenBitmap>(&queue, 0, 0, 4, 4, MKBitmap::DefaultFramebuffer));
-    posted->ActivateFrameBuffer();
-    queue.RunAll();
-    EXPECT_EQ(posted->activations, 1);
-    EXPECT_EQ(CountOf(posted.Get()), 1);
-    OnRenderThread const here;
-    auto const direct = RefPtr<MyScreen<MKScreenBitmapRT>>::Adopt(
-        new MyScreen<MKScreenBitmapRT>(&queue, 0, 0, 4, 4, MKBitmap::DefaultFramebuffer));
-    direct->ActivateFrameBuffer();
-    EXPECT_EQ(direct->activations, 1);
-}
-
-TEST_F(ScreenBitmap, AnUnknownTypeGivesOneErrorLineAndAnInertBitmap) {
-    auto const type = static_cast<MKBitmap::FramebufferType>(5);
-    auto const posted = BitmapPtr::Adopt(new MKScreenBitmap(&queue, 0, 0, 4, 4, type));
-    queue.RunAll();
-    RendererTrace::DeclareRenderThread();
-    auto const direct = BitmapPtr::Adopt(new MKScreenBitmapRT(&queue, 0, 0, 4, 4, type));
-    EXPECT_THAT(log.GetTexts(ANDROID_LOG_ERROR), ElementsAre("createRenderTargetRT Invalid framebuffer type",
-                                                             "MKScreenBitmapRT Invalid framebuffer type"));
-    EXPECT_EQ(log.GetLines()[0].tag, "mok_log");
-    EXPECT_EQ(log.GetLines()[0].format, "%s Invalid framebuffer type");
-    for (BitmapPtr const& screen : {posted, direct}) {
-        Seen seen;
-        screen->GetPixelAsync(Point(1, 1), &seen, Seen::OnPixel);
-        queue.RunAll();
-        EXPECT_EQ(seen.pixel, 0u);
-    }
-}
-
-TEST_F(ScreenBitmap, RefusedOperationsKeepTheirReference) {
-    refuse = true;
-    IMKBitmap* const screen = MKGraphicsFactory::CreateScreenBitmap(&picky, 0, 0, 4, 4, 1, 1);
-    EXPECT_EQ(CountOf(screen), 2);
-    EXPECT_EQ(screen->GetPixel(Point(1, 1)), 0u);
-    unsigned pixels[16] = {};
-    screen->GetBitmapData(Rect(0, 0, 4, 4), pixels);
-    screen->GetBitmapWritable()->ActivateFrameBuffer();
-    EXPECT_EQ(picky.GetWaitCount(), 2) << "waits all the same";
-    EXPECT_EQ(CountOf(screen), 5);
-    for (int i = 0; i < 5; ++i) screen->Unref(); // what the refusals leak, by design
 }
 
 } // namespace

@@ -49,84 +49,6 @@ TEST_F(SubBitmap, EveryPostedOperationHoldsOneReferenceUntilItRan) {
     EXPECT_EQ(get(TextureParamWrappingT), TextureWrapRepeat);
 }
 
-template <class Strip>
-struct MyStrip : Strip {
-    using Strip::Strip;
-    void AttachStencilBufferRT(bool release) override {
-        ++attachments;
-        Strip::AttachStencilBufferRT(release);
-    }
-    void SetTextureFilterRT(TextureParamFilteringValue value, bool release) override {
-        filter = value;
-        Strip::SetTextureFilterRT(value, release);
-    }
-    using Strip::SetTextureFilterRT;
-    int attachments = 0;
-    int filter = -1;
-};
-
-TEST_F(SubBitmap, ItsTasksReachTheOverridesOfADerivedClass) {
-    auto const posted = RefPtr<MyStrip<MKSubBitmap>>::Adopt(
-        new MyStrip<MKSubBitmap>(&queue, 0, Rect(0, 0, 4, 4), 4, 4, nullptr, false));
-    OnRenderThread const here;
-    auto const direct = RefPtr<MyStrip<MKSubBitmapRT>>::Adopt(
-        new MyStrip<MKSubBitmapRT>(&queue, 0, Rect(0, 0, 4, 4), 4, 4, nullptr, false));
-    auto const use = [](auto& strip) {
-        strip.AttachDepthBuffer();
-        strip.SetTextureFilter(TextureFilterNearest);
-    };
-    use(*posted);
-    use(*direct);
-    queue.RunAll();
-    RendererTrace::DeclareRenderThread();
-    EXPECT_EQ(posted->attachments + direct->attachments, 2);
-    EXPECT_EQ(posted->filter, TextureFilterNearest);
-    EXPECT_EQ(direct->filter, TextureFilterNearest);
-    EXPECT_EQ(CountOf(posted.Get()), 1);
-}
-
-TEST_F(SubBitmap, ARefusedPostKeepsTheReferenceAndDropsTheRequest) {
-    auto strip = MakeStrip(&picky, Rect(0, 0, 4, 4));
-    picky.RunAll();
-    refuse = true;
-    strip->CreateFrameBuffer();
-    strip->SetTag("never seen");
-    EXPECT_EQ(strip->GetPixel(Point(0, 0)), 0u);
-    EXPECT_EQ(picky.GetWaitCount(), 1) << "a refused read still waits for the queue";
-    EXPECT_EQ(CountOf(strip.Get()), 4);
-    refuse = false;
-    for (int i = 0; i < 3; ++i) strip->Unref(); // what the refusals have leaked, by design
-    picky.RunAll();
-    EXPECT_EQ(LabelOf(strip->GetTexture()), std::string());
-}
-
-TEST_F(SubBitmap, ItsGpuObjectsDieOnTheRenderThreadInOrder) {
-    auto strip = MakeStrip(&queue, Rect(0, 0, 4, 4));
-    strip->CreateFrameBuffer();
-    strip->AttachDepthBuffer();
-    queue.RunAll();
-    RendererTrace::TakeCalls();
-    strip = {};
-    EXPECT_EQ(queue.GetPendingCount(), 4);
-    EXPECT_TRUE(RendererTrace::TakeCalls().empty());
-    queue.RunAll();
-    EXPECT_EQ(RendererTrace::TakeCalls(),
-              (std::vector<std::string>{"target 1 DetachDepthStencil buffer 1", "buffer 1 Release",
-                                        "target 1 Release", "texture 1 Release"}));
-}
-
-TEST_F(SubBitmap, ADeletionThatIsRefusedLeaksTheObjectAndNothingElse) {
-    auto strip = MakeStrip(&picky, Rect(0, 0, 4, 4));
-    picky.RunAll();
-    ITextureObject* const texture = strip->GetTexture();
-    refuse = true;
-    strip = {};
-    refuse = false;
-    EXPECT_EQ(RendererTrace::CountLiveObjects(), 1);
-    OnRenderThread const here;
-    delete texture;
-}
-
 // A strip measures against its size, inclusive, and not against its edges; callers rely on it.
 TEST_F(SubBitmap, ReadsAPixelByItsOwnOddBounds) {
     constexpr Point kOutside(-1, -1); // reads 0
@@ -135,11 +57,9 @@ TEST_F(SubBitmap, ReadsAPixelByItsOwnOddBounds) {
         Point asked, read;
     } const cases[] = {
         {Rect(0, 0, 6, 5), Point(0, 0), Point(0, 0)},
-        {Rect(0, 0, 6, 5), Point(5, 4), Point(5, 4)},
         {Rect(0, 0, 6, 5), Point(6, 5), Point(5, 4)}, // the size itself reads the last pixel
         {Rect(0, 0, 6, 5), Point(6, 0), Point(5, 0)},
         {Rect(0, 0, 6, 5), Point(-1, 0), kOutside},
-        {Rect(0, 0, 6, 5), Point(0, -1), kOutside},
         {Rect(0, 0, 6, 5), Point(7, 0), kOutside},
         {Rect(0, 0, 6, 5), Point(0, 6), kOutside},
         {Rect(2, 3, 8, 10), Point(4, 5), Point(4, 5)}, // off the origin
@@ -163,33 +83,11 @@ TEST_F(SubBitmap, ReadsAPixelByItsOwnOddBounds) {
     EXPECT_EQ(row, Pixels(pixels.begin() + 12 * 16, pixels.begin() + 13 * 16)) << "rectangles know better";
 }
 
-TEST_F(SubBitmap, AsynchronousReadsCallBackEvenWhenThereIsNothingToRead) {
-    RendererTrace::FailCreations(ObjectKind::kTexture);
-    auto strip = MakeStrip(&queue, Rect(0, 0, 4, 4));
-    Seen seen;
-    Pixels untouched(64, 9);
-    strip->GetPixelAsync(Point(1, 1), &seen, Seen::OnPixel);
-    strip->GetBitmapDataAsync(Rect(0, 0, 4, 4), untouched.data(), &seen, Seen::OnData);
-    EXPECT_EQ(seen.calls, 0);
-    queue.RunAll();
-    RendererTrace::StopFailing();
-    EXPECT_EQ(seen.calls, 2);
-    EXPECT_EQ(seen.pixel, 0u);
-    EXPECT_EQ(seen.rect, Rect(0, 0, 4, 4));
-    EXPECT_EQ(seen.destination, untouched.data());
-    EXPECT_EQ(untouched, Pixels(64, 9));
-}
-
-TEST_F(SubBitmap, AThrowingCallbackCostsNoReference) {
-    auto strip = MakeStrip(&queue, Rect(0, 0, 4, 4));
-    queue.RunAll();
-    Pixels pixels(64);
-    strip->GetPixelAsync(Point(1, 1), nullptr, Thrown::OnPixel);
-    strip->GetBitmapDataAsync(Rect(0, 0, 4, 4), pixels.data(), nullptr, Thrown::OnData);
-    EXPECT_THROW(queue.RunOne(), Thrown);
-    EXPECT_THROW(queue.RunOne(), Thrown);
-    EXPECT_EQ(CountOf(strip.Get()), 1);
-}
+// Says at once that it has caught up, as every queue does on its own thread.
+class HastyQueue final : public HandPumpedQueue {
+public:
+    void WaitForTasks() override {}
+};
 
 [[gnu::noinline]] unsigned int GetPixelBelow(IMKSubBitmap& strip) {
     unsigned char volatile above[512] = {};
@@ -208,11 +106,15 @@ TEST_F(SubBitmap, AThrowingCallbackCostsNoReference) {
 
 TEST_F(SubBitmap, APixelThatIsReadTooLateHarmsNobody) {
     Pixels const pixels = UniquePixels(4, 4);
+    HastyQueue hasty;
+    RunOnRenderThread(hasty);
     auto strip = MakeStrip(&hasty, Rect(0, 0, 4, 4), &pixels);
     hasty.RunAll();
     EXPECT_EQ(GetPixelBelow(*strip), 0u);
     EXPECT_TRUE(IsUntouchedWhile(hasty));
     EXPECT_EQ(CountOf(strip.Get()), 1);
+    strip = {};
+    hasty.RunAll();
     {
         HastyQueue dropping; // with the read in it
         auto lost = MakeStrip(&dropping, Rect(0, 0, 4, 4));
@@ -220,18 +122,6 @@ TEST_F(SubBitmap, APixelThatIsReadTooLateHarmsNobody) {
         for (int i = 0; i < 2; ++i) lost->Unref(); // what the dropped tasks leak
     }
 }
-
-#if defined(MOKA_CHECKS) && MOKA_CHECKS
-TEST_F(SubBitmap, ABlockThatIsReadTooLateIsABrokenContract) {
-    auto strip = MakeStrip(&hasty, Rect(0, 0, 4, 4));
-    hasty.RunAll();
-    Pixels pixels(64);
-    EXPECT_DEATH(strip->GetBitmapData(Rect(0, 0, 4, 4), pixels.data()), "has not caught up");
-    auto screen = BitmapPtr::Adopt(MKGraphicsFactory::CreateScreenBitmap(&hasty, 0, 0, 4, 4, 1, 1));
-    hasty.RunAll();
-    EXPECT_DEATH(screen->GetBitmapData(Rect(0, 0, 4, 4), pixels.data()), "has not caught up");
-}
-#endif
 
 TEST_F(SubBitmap, ProjectionMapsItsRectangleWithRowZeroFirst) {
     Matrix4<float> const m = MakeStrip(&queue, Rect(10, 20, 50, 60))->GetProjectionMatrix();

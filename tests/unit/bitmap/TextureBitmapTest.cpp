@@ -17,15 +17,6 @@ std::vector<Rect> RectsOf(BitmapPtr const& bitmap) {
     return rects;
 }
 
-TEST_F(TextureBitmap, IsCutAtTheLargestTextureSide) {
-    EXPECT_EQ(RectsOf(NewBitmap(5, kMaxSide)), (std::vector<Rect>{Rect(0, 0, 5, 64)}));
-    auto const bitmap = NewBitmap(5, kMaxSide + 1);
-    EXPECT_EQ(RectsOf(bitmap), (std::vector<Rect>{Rect(0, 0, 5, 64), Rect(0, 64, 5, 65)}));
-    EXPECT_EQ(StripOf(bitmap, 2), nullptr);
-    EXPECT_EQ(StripOf(bitmap, -1), nullptr);
-    EXPECT_EQ(bitmap->GetPixel(Point(5, 0)), 0u) << "no strip contains it";
-}
-
 TEST_F(TextureBitmap, ARegionGetsStripsOnlyWhereItIsAndTheyKeepTheirNumbers) {
     int const h = 3 * kMaxSide;
     Pixels const pixels = UniquePixels(10, h);
@@ -80,23 +71,6 @@ TEST_F(TextureBitmap, ACallbackMayDropTheLastReference) {
     EXPECT_TRUE(gone);
 }
 
-TEST_F(TextureBitmap, UpdatesReachTheStripsTheyTouch) {
-    auto const bitmap = NewBitmap(4, 2 * kMaxSide);
-    EXPECT_EQ(ReadAll(bitmap), Pixels(4 * 2 * kMaxSide * 4)) << "transparent, whatever memory held";
-    auto const countUploads = [&] {
-        queue.RunAll();
-        int const count = RendererTrace::CountCalls("Replace");
-        RendererTrace::TakeCalls();
-        return count;
-    };
-    Pixels const pixels = UniquePixels(4, kMaxSide);
-    bitmap->GetTextureBitmap()->UpdateBitmap(Rect(0, 10, 4, 13), pixels.data(), 16);
-    EXPECT_EQ(countUploads(), 1);
-    bitmap->GetTextureBitmap()->UpdateBitmap(pixels.data(), 0);
-    EXPECT_EQ(countUploads(), 2) << "each strip, the same pixels";
-    EXPECT_EQ(RendererTrace::GetTexels(StripOf(bitmap, 1)->GetTexture()), pixels);
-}
-
 TEST_F(TextureBitmap, CanvasesHoldItAndItsFrameBuffers) {
     auto const bitmap = NewBitmap(4, 2 * kMaxSide);
     IMKBitmapCanvasAttachable* const attachable = bitmap->GetBitmapCanvasAttachable();
@@ -121,62 +95,6 @@ TEST_F(TextureBitmap, CanvasesHoldItAndItsFrameBuffers) {
     EXPECT_EQ(CountOf(bitmap.Get()), 1) << "the canvas's and the task's";
 }
 
-TEST_F(TextureBitmap, OnTheRenderThreadSamplingReachesEveryStripAndActivationTheFirst) {
-    auto const bitmap = NewBitmap(4, 2 * kMaxSide);
-    bitmap->GetBitmapCanvasAttachable()->AttachToCanvas();
-    IMKBitmapReadable* const readable = bitmap->GetBitmapReadable();
-    IMKBitmapWritable* const writable = bitmap->GetBitmapWritable();
-    writable->ActivateFrameBuffer();
-    writable->DeactivateFrameBuffer(DiscardFramebufferNone);
-    queue.RunAll();
-    EXPECT_EQ(RendererTrace::CountCalls("Activate"), 1);
-    {
-        OnRenderThread const here;
-        // These ignore their release argument.
-        readable->SetTextureFilterRT(TextureFilterNearest, true);
-        readable->SetTextureFilterRT(TextureParamFilteringMin, TextureFilterLinear, true);
-        readable->SetTextureWrapRT(TextureWrapRepeat, true);
-        readable->SetTextureWrapRT(TextureParamWrappingS, TextureWrapMirroredRepeat, true);
-        EXPECT_EQ(CountOf(bitmap.Get()), 2);
-        for (int i = 0; i < 2; ++i) {
-            ITextureObject* const texture = StripOf(bitmap, i)->GetTexture();
-            EXPECT_EQ(RendererTrace::GetParameter(texture, TextureParamFilteringMag), TextureFilterNearest);
-            EXPECT_EQ(RendererTrace::GetParameter(texture, TextureParamWrappingS), TextureWrapMirroredRepeat);
-        }
-        for (int i = 0; i < 5; ++i) bitmap->Ref();
-        readable->ActivateTextureRT(0, true);
-        writable->ActivateFrameBufferRT(true);
-        bitmap->GetTextureBitmap()->AttachStencilBufferRT(true);
-        EXPECT_EQ(RendererFactory::GetStatistics().depthStencilBuffers, 1);
-        writable->ClearColorRT(1, 0, 0, 1);
-        writable->ClearDepthStencilRT(true, 1, true, 0);
-        bitmap->GetTextureBitmap()->DetachStencilBufferRT(true);
-        writable->DeactivateFrameBufferRT(true, DiscardFramebufferNone);
-        EXPECT_EQ(CountOf(bitmap.Get()), 2);
-        EXPECT_EQ(RendererTrace::GetBoundTexture(0), RendererTrace::NameOf(StripOf(bitmap)->GetTexture()));
-    }
-    Pixels const pixels = ReadAll(bitmap);
-    EXPECT_EQ(PixelAt(pixels, 4, 0, 0), 0xFF0000FFu) << "red, as bytes in the order RGBA";
-    EXPECT_EQ(PixelAt(pixels, 4, 3, kMaxSide), 0xFF0000FFu);
-    bitmap->GetBitmapCanvasAttachable()->DetachFromCanvas();
-}
-
-TEST_F(TextureBitmap, AnEmptyBitmapDoesNothingAndSurvivesEverything) {
-    auto const bitmap = BitmapPtr::Adopt(
-        MKGraphicsFactory::CreateBitmap(&queue, reinterpret_cast<TextureObject const*>(this), 1));
-    EXPECT_EQ(bitmap->GetBitmapRect(), Rect());
-    EXPECT_EQ(bitmap->GetPixel(Point(0, 0)), 0u);
-    Seen seen;
-    bitmap->GetBitmapDataAsync(Rect(0, 0, 1, 1), nullptr, &seen, Seen::OnData);
-    bitmap->GetBitmapWritable()->ActivateFrameBuffer();
-    bitmap->GetBitmapReadable()->SetTextureFilter(TextureFilterLinear);
-    bitmap->GetBitmapCanvasAttachable()->AttachToCanvas();
-    bitmap->GetBitmapCanvasAttachable()->DetachFromCanvas();
-    EXPECT_EQ(bitmap->GetBitmapWritable()->GetProjectionMatrix(), Matrix4<float>());
-    EXPECT_EQ(queue.RunAll(), 0);
-    EXPECT_EQ(seen.calls, 0);
-}
-
 TEST_F(TextureBitmap, TheTagReachesEveryStripAndIsCut) {
     auto const bitmap = NewBitmap(4, 2 * kMaxSide);
     bitmap->SetTag(std::string(200, 't').c_str());
@@ -186,6 +104,47 @@ TEST_F(TextureBitmap, TheTagReachesEveryStripAndIsCut) {
     queue.RunAll();
     EXPECT_EQ(bitmap->GetTag(), std::string("short"));
     for (int i = 0; i < 2; ++i) EXPECT_EQ(LabelOf(StripOf(bitmap, i)->GetTexture()), std::string("short"));
+}
+
+// Shared bitmaps: one image under several bitmaps, in whatever order they come and go.
+TEST_F(TextureBitmap, ACloneMadeBeforeAnythingRanShowsTheImage) {
+    int const h = 2 * kMaxSide + 1;
+    Pixels const pixels = UniquePixels(4, h);
+    auto const parent = NewBitmap(4, h, pixels.data());
+    parent->SetTag("named");
+    auto const clone = BitmapPtr::Adopt(parent->Clone());
+    ASSERT_EQ(queue.GetRunCount(), 0);
+    EXPECT_EQ(clone->GetTag(), std::string("named"));
+    EXPECT_EQ(ReadAll(clone), pixels);
+    EXPECT_EQ(CountOf(clone.Get()), 1);
+    EXPECT_EQ(CountOf(parent.Get()), 2) << "the clone holds its parent";
+    for (int i = 0; i < 3; ++i) EXPECT_EQ(CountOf(StripOf(parent, i)) + CountOf(StripOf(clone, i)), 2);
+    clone->GetBitmapReadable()->SetTextureWrap(TextureWrapRepeat); // sampling is each one's own
+    queue.RunAll();
+    EXPECT_NE(RendererTrace::GetParameter(StripOf(parent)->GetTexture(), TextureParamWrappingS),
+              TextureWrapRepeat);
+}
+
+TEST_F(TextureBitmap, ReleasedInEitherOrderTheImageLivesToTheLast) {
+    Pixels const pixels = UniquePixels(4, 4);
+    for (bool parentFirst : {true, false}) {
+        auto parent = NewBitmap(4, 4, pixels.data());
+        auto clone = BitmapPtr::Adopt(parent->Clone());
+        auto grandchild = BitmapPtr::Adopt(clone->Clone());
+        (parentFirst ? parent : grandchild) = {};
+        clone = {};
+        queue.RunAll();
+        EXPECT_EQ(ReadAll(parentFirst ? grandchild : parent), pixels);
+        EXPECT_EQ(RendererFactory::GetStatistics().textures, 1) << "one storage";
+    }
+}
+
+TEST_F(TextureBitmap, ReleasedBeforeItsTasksRanItStillCleansUp) {
+    MKGraphicsFactory::ReleaseBitmap([this] {
+        auto const parent = NewBitmap(4, 2 * kMaxSide);
+        return parent->Clone();
+    }());
+    EXPECT_GT(queue.GetPendingCount(), 0);
 }
 
 } // namespace

@@ -14,8 +14,6 @@ using ::testing::SizeIs;
 constexpr auto Intersect = IMKCanvasBase::Intersect;
 constexpr auto Replace = IMKCanvasBase::Replace;
 constexpr auto Union = IMKCanvasBase::Union;
-constexpr int kMaxInt = std::numeric_limits<int>::max();
-constexpr int kMinInt = std::numeric_limits<int>::min();
 
 char const kWarning[] =
     "!CLIPPING PERFORMANCE WARNING! MKCanvasClipping::EnableClip Stencil Clip. This clipping "
@@ -177,33 +175,6 @@ TEST_F(Clipping, StatesAndProgramAreThereBeforeTheFirstStencilClear) {
     EXPECT_THAT(steps, ElementsAre("blend 1", "depthstencil 1", "program 1"));
 }
 
-TEST_F(Clipping, TheShaderComesFirstAndTheClippingGoesBeforeTheDrawables) {
-    auto const take = [this](std::string const& operation) {
-        std::vector<std::string> kinds;
-        for (std::string const& call : TakeCalls(operation)) kinds.push_back(call.substr(0, call.find(' ')));
-        return kinds;
-    };
-    for (bool const draws : {false, true}) {
-        canvas = {};
-        queue.RunAll();
-        RendererTrace::TakeCalls();
-        canvas = NewCanvas(target);
-        EXPECT_THAT(take("Create"), ElementsAre("target", "program", "graphics", "graphics", "depthstencil",
-                                                "blend", "depthstencil"));
-        if (draws) canvas->DrawRect(1, 1, 9, 9, &paint);
-        queue.RunAll();
-        RendererTrace::TakeCalls();
-        canvas = {};
-        if (draws)
-            EXPECT_THAT(take("Release"),
-                        ElementsAre("graphics", "graphics", "depthstencil", "blend", "depthstencil",
-                                    "graphics", "blend", "depthstencil", "program", "target"));
-        else
-            EXPECT_THAT(take("Release"), ElementsAre("program", "graphics", "graphics", "depthstencil",
-                                                     "blend", "depthstencil", "target"));
-    }
-}
-
 TEST_F(Clipping, AClippedDrawLeavesTheScissorAsItWasAndAnUnclippedOneOff) {
     auto const setScissor = [](bool on) {
         OnRenderThread const here;
@@ -258,47 +229,6 @@ TEST_F(ClipCounts, MoreThanThereAreAddsEmptyOnesAndFewerDropTheLast) {
     EXPECT_EQ(ProjectionOf(RendererTrace::GetDraws()[2])[0], 0.0f);
     clipping->RemoveClipRectRT(0);
     EXPECT_FALSE(Enabled().scissorOn);
-}
-
-TEST_F(ClipCounts, WildCountsAndNumbersAreHarmless) {
-    for (int count : {kMinInt, -1}) {
-        clipping->AddClipRectRT({1, 1, 9, 9, Intersect, {}});
-        clipping->RemoveClipRectRT(count);
-        EXPECT_FALSE(clipping->HasClips());
-    }
-    clipping->RemoveClipRectRT(kMaxInt);
-    EXPECT_EQ(Enabled().scissor, (ScissorRect{0, kHeight, 0, 0}));
-    clipping->RemoveClipRectRT(0);
-
-    // Reaches over everything, and so does its float sum.
-    clipping->AddClipRectRT({kMinInt / 2, kMinInt / 2, kMaxInt, kMaxInt, Intersect, {}});
-    clipping->AddClipRectRT(
-        {kMinInt, kMinInt, kMaxInt, kMaxInt, Intersect, Matrix3<float>::scaleMatrix(4, 4)});
-    clipping->AddClipRectRT({2, 3, 10, 10, Intersect, {}});
-    EXPECT_EQ(Enabled().scissor, (ScissorRect{0, kHeight, 0, 0})) << "the second ends left of the target";
-    clipping->RemoveClipRectRT(1);
-    clipping->AddClipRectRT({2, 3, 10, 10, Intersect, {}});
-    EXPECT_EQ(Enabled().scissor, (ScissorRect{2, 3, 10, 10}));
-    for (float odd : {kNaN, kInfinity, -kInfinity, 3e38f})
-        for (int i : {0, 3, 4, 6, 7, 8})
-            for (auto op : {Union, Intersect}) {
-                Matrix3<float> m;
-                m[i] = odd;
-                clipping->AddClipRectRT({1, 1, kMaxInt, kMinInt, op, m});
-                Enabled();
-                clipping->RemoveClipRectRT(0);
-            }
-}
-
-TEST_F(Clipping, NumbersWithoutANameAddNothing) {
-    Clip(0, 0, 10, 10);
-    Clip(5, 5, 10, 10, Union);
-    canvas->DrawRect(0, 0, 50, 60, &paint);
-    std::size_t const steps = TakeDraws().size();
-    Clip(5, 5, 10, 10, static_cast<IMKCanvasBase::ClipOp>(-77));
-    canvas->Save(static_cast<IMKCanvasBase::SaveFlag>(77));
-    canvas->DrawRect(0, 0, 50, 60, &paint);
-    EXPECT_THAT(TakeDraws(), SizeIs(steps));
 }
 
 } // namespace

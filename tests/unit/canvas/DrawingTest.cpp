@@ -1,10 +1,7 @@
 // The render side: what is skipped, which strips are drawn, and what is given back.
 #include "moka/base/log/AndroidLog.h"
-#include "moka/graphics/canvas/MKCanvasImpl.h"
-#include "tests/support/Allocation.h"
 #include "tests/unit/canvas/CanvasFixture.h"
 
-#include <optional>
 #include <stdexcept>
 
 namespace Moka::Testing {
@@ -115,31 +112,6 @@ TEST_F(Drawing, ATallBitmapIsDrawnInClampedPiecesAndOneThatTilesWhole) {
     }
 }
 
-TEST_F(Drawing, ABatchDrawsWhatIsVisibleAtOnceIntoTheFirstStrip) {
-    auto const source = NewBitmap(10, 10);
-    std::vector<RectF> const dsts{{-20, 0, -10, 9}, {1, 2, 3, 4}, {0, 70, 9, 80}, {90, 0, 99, 9}};
-    canvas->DrawBitmaps(source.Get(), RectF(0, 0, 5, 5), dsts, &paint);
-    TracedDraw const draw = TakeDraw();
-    EXPECT_EQ(draw.target, "target 1");
-    EXPECT_EQ(draw.count, 12) << "the second and the third";
-    EXPECT_EQ(draw.vertices[0], 1);
-    EXPECT_EQ(draw.vertices[6 * 5 + 1], 70);
-
-    canvas->DrawBitmaps(source.Get(), RectF(20, 20, 30, 30), dsts, &paint); // beside the source
-    canvas->DrawBitmaps(source.Get(), {dsts[0], dsts[3]}, &paint);          // beside the target
-    canvas->DrawBitmaps(source.Get(), std::vector<RectF>(), &paint);
-    EXPECT_THAT(TakeDraws(), IsEmpty());
-    EXPECT_EQ(CountOf(source.Get()), 1);
-}
-
-TEST_F(Drawing, AScreenBitmapIsNotCutIntoStrips) {
-    Use(NewScreen(100, 100));
-    canvas->DrawRect(10, 10, 20, 90, &paint);
-    EXPECT_EQ(ProjectionOf(TakeDraw()), NumbersOf(target->GetBitmapWritable()->GetProjectionMatrix()));
-    canvas->DrawRect(10, 101, 20, 110, &paint);
-    EXPECT_THAT(TakeDraws(), IsEmpty());
-}
-
 TEST_F(Drawing, ACustomDrawableIsDrawnOnEveryStripAsFrameBufferMinusOne) {
     FakeDrawable drawable;
     std::vector<std::string> targets;
@@ -172,8 +144,6 @@ TEST_F(Drawing, ADrawableThatThrowsLeavesNoTargetClipOrReferenceBehind) {
     EXPECT_FALSE(RendererTrace::GetState().scissorOn);
 }
 
-// When the vertices of a new drawable are refused, memory runs out for the rest of its making: for its shader,
-// which throws. A rectangle's exists already, because the clip has it.
 TEST_F(Drawing, ClearingGivesItsTargetBackAndClearingAllLeavesTheScissorOff) {
     canvas->SetClipRect(10, 50, 20, 30, IMKCanvasBase::Intersect);
     canvas->Clear(0.25f, 0.5f, 0.75f, 1);

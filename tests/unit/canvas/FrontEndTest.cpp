@@ -2,9 +2,6 @@
 // behind.
 #include "tests/support/Allocation.h"
 #include "tests/unit/canvas/CanvasFixture.h"
-#include "tests/unit/canvas/EveryOperation.h"
-
-#include <utility>
 
 namespace Moka::Testing {
 namespace {
@@ -32,30 +29,6 @@ TEST_F(FrontEnd, ARequestHasTheMatrixOfItsTimeAndWithoutAPaintANewOne) {
     EXPECT_EQ(draw.state.scissor, (ScissorRect{5, 6, 10, 10}));
     EXPECT_THAT(draw.uniforms.at("uColor").numbers, ElementsAre(1, 1, 1, 1));
     EXPECT_EQ(draw.state.blend.GetColorEquation().destination, BlendingFactor::OneMinusSrcAlpha);
-}
-
-TEST_F(FrontEnd, OnTheRenderThreadTheSameIsDrawnAtOnce) {
-    Use(NewBitmap(60, kMaxSide + 10));
-    auto const source = NewBitmap(20, kMaxSide + 10);
-    FakeDrawable drawable;
-    DrawEverything(*canvas.Get(), source.Get(), &drawable);
-    std::vector<std::string> const expected = TakePictures();
-    EXPECT_GT(expected.size(), 35u);
-    canvas = {};
-    queue.RunAll();
-    {
-        OnRenderThread const here;
-        int const before = queue.GetPostedCount();
-        auto const direct = CanvasPtr::Adopt(MKGraphicsFactory::CreateCanvas(&queue, target.Get(), 0));
-        DrawEverything(*direct.Get(), source.Get(), &drawable);
-        EXPECT_EQ(queue.GetPostedCount(), before);
-        EXPECT_EQ(TakePictures(), expected);
-        EXPECT_EQ(direct->GetBitmap(), target.Get());
-    }
-    EXPECT_EQ(drawable.draws, 4);
-    EXPECT_EQ(drawable.references, 1);
-    EXPECT_EQ(CountOf(source.Get()), 1);
-    EXPECT_EQ(CountOf(target.Get()), 1);
 }
 
 TEST_F(FrontEnd, ARoundRectangleNeedsBothRadii) {
@@ -114,37 +87,6 @@ TEST_F(FrontEnd, SavedLevelsHoldMatrixAndClipCountOrThePreviousOnes) {
     EXPECT_FALSE(isClipped());
 }
 
-TEST_F(FrontEnd, MatrixAndTagAreLocalAndTheTailOfALongTagStays) {
-    Matrix3<float> const m(1, 0.2f, 0, 0.3f, 1, 0, 5, 6, 1);
-    Matrix3<float> expected = m;
-    expected.preConcat(m), expected.postConcat(m), expected.preScale(2, 3);
-    expected.postScale(0.5f, 0.75f), expected.preRotate(10), expected.preRotate(20, 1, 2);
-    expected.postRotate(30), expected.postRotate(40, 3, 4), expected.preTranslate(7, 8);
-    expected.postTranslate(9, 10);
-    IMKCanvas& c = *canvas.Get();
-    TransformInEveryWay(c);
-    EXPECT_EQ(c.GetMatrix(), expected);
-
-    c.SetTag(std::string(200, 'x').c_str());
-    EXPECT_EQ(c.GetTag(), std::string(126, 'x'));
-    c.SetTag("abc");
-    c.SetTag(nullptr);
-    EXPECT_EQ(c.GetTag(), "abc" + std::string(123, 'x'));
-    EXPECT_EQ(queue.GetPendingCount(), 0);
-    EXPECT_EQ(c.GetMsgQueue(), &queue);
-}
-
-TEST_F(FrontEnd, TheCanvasHoldsItsTargetTwiceUntilItIsDeletedOnTheRenderThread) {
-    EXPECT_EQ(CountOf(target.Get()), 3);
-    canvas->DrawRect(1, 1, 9, 9, &paint);
-    canvas->Ref();
-    EXPECT_EQ(canvas->Unref(), 1);
-    canvas = {};
-    EXPECT_EQ(CountOf(target.Get()), 3);
-    EXPECT_THAT(TakeDraws(), SizeIs(1)) << "what was posted is still drawn";
-    EXPECT_EQ(CountOf(target.Get()), 1);
-}
-
 TEST_F(FrontEnd, ASourceIsHeldUntilDrawnAndWhatCannotBeDrawnIsNotPosted) {
     auto source = NewBitmap(10, 20);
     auto const screen = NewScreen(9, 9);
@@ -176,19 +118,23 @@ TEST_F(FrontEnd, ASourceIsHeldUntilDrawnAndWhatCannotBeDrawnIsNotPosted) {
 }
 
 TEST_F(FrontEnd, RefusedRequestsAreDroppedAndOnlyTheReferencesStay) {
-    auto const onPicky = NewPickyBitmap(50, 50);
     auto source = NewBitmap(10, 20);
-    canvas = CanvasPtr::Adopt(MKGraphicsFactory::CreateCanvas(&picky, onPicky.Get(), 1));
     FakeDrawable drawable;
-    picky.RunAll();
     queue.RunAll();
+    std::vector<PointF> points{{1, 2}, {20, 30}};
+    std::vector<RectF> const rects{{1, 2, 3, 4}};
     refuse = true;
-    DrawEverything(*canvas.Get(), source.Get(), &drawable);
+    canvas->DrawRect(rects[0], &paint);
+    canvas->DrawSimpleLines(points, &paint);
+    canvas->Draw(&drawable, &paint);
+    canvas->DrawBitmap(source.Get(), rects[0], rects[0], &paint);
+    canvas->DrawBitmaps(source.Get(), points, &paint);
+    canvas->DrawBitmaps(source.Get(), rects[0], rects, &paint);
     refuse = false;
-    EXPECT_EQ(picky.GetPendingCount(), 0);
-    EXPECT_EQ(CountOf(source.Get()), 1 + 6);
+    EXPECT_EQ(queue.GetPendingCount(), 0);
+    EXPECT_EQ(CountOf(source.Get()), 1 + 3);
     EXPECT_EQ(drawable.references, 2);
-    for (int i = 0; i < 6; ++i) source->Unref(); // what refusals leak, by design
+    for (int i = 0; i < 3; ++i) source->Unref(); // what refusals leak, by design
     // A refused clip counts all the same: saved and restored, it comes back as one that hides everything.
     refuse = true;
     canvas->SetClipRect(0, 0, 9, 9, IMKCanvasBase::Intersect);
@@ -197,56 +143,14 @@ TEST_F(FrontEnd, RefusedRequestsAreDroppedAndOnlyTheReferencesStay) {
     canvas->Save(IMKCanvasBase::SaveAll);
     canvas->Restore(0);
     canvas->DrawRect(0, 0, 20, 20, &paint);
-    RendererTrace::TakeEvents();
-    picky.RunAll();
-    ASSERT_THAT(RendererTrace::GetDraws(), SizeIs(1));
-    EXPECT_TRUE(RendererTrace::GetDraws()[0].state.scissorOn);
-    EXPECT_EQ(RendererTrace::GetDraws()[0].state.scissor.width, 0);
-    canvas = {};
-    picky.RunAll();
-}
-
-TEST_F(FrontEnd, ARefusedDeletionLeavesTheRenderSideAlive) {
-    canvas = {};
-    queue.RunAll();
-    int held = 0;
-    RefusingQueue some(RefusingQueue::Predicate([&](int ordinal, ITask* task) {
-        if (ordinal == 1) return false; // the making of the clip
-        held = CountOf(target.Get());
-        OnRenderThread const here;
-        task->run(); // what it would have leaked, by design
-        return true;
-    }));
-    auto onSome = CanvasPtr::Adopt(MKGraphicsFactory::CreateCanvas(&some, target.Get(), 1));
-    {
-        OnRenderThread const here;
-        some.RunAll();
-    }
-    onSome = {};
-    EXPECT_EQ(held, 3);
-    EXPECT_EQ(some.GetRefusedCount(), 1);
-}
-
-TEST_F(FrontEnd, OutOfMemoryDropsRequests) {
-    auto const source = NewBitmap(10, 20);
-    queue.RunAll();
-    std::vector<PointF> points{{1, 2}, {20, 30}};
-    std::vector<RectF> const rects{{1, 2, 3, 4}};
-    {
-        FailAllocations failing;
-        canvas->DrawSimpleLines(points, &paint);
-        canvas->DrawBitmaps(source.Get(), points, &paint);
-        canvas->DrawBitmaps(source.Get(), rects, &paint);
-    }
-    EXPECT_EQ(queue.GetPendingCount(), 0);
-    EXPECT_EQ(CountOf(source.Get()), 1);
+    PipelineState const state = TakeDraw().state;
+    EXPECT_TRUE(state.scissorOn);
+    EXPECT_EQ(state.scissor.width, 0);
 }
 
 TEST_F(FrontEnd, ARequestAllocatesNothingButItsTask) {
-    auto const onPicky = NewPickyBitmap(50, 50);
-    canvas = CanvasPtr::Adopt(MKGraphicsFactory::CreateCanvas(&picky, onPicky.Get(), 1));
     canvas->DrawRect(1, 2, 3, 4, &paint); // fills the pool of tasks
-    picky.RunAll();
+    queue.RunAll();
     refuse = true; // what is refused goes back to the pool
     int const before = GetAllocationCount();
     for (int i = 0; i < 1000; ++i) {
@@ -257,8 +161,6 @@ TEST_F(FrontEnd, ARequestAllocatesNothingButItsTask) {
     }
     EXPECT_EQ(GetAllocationCount(), before);
     refuse = false;
-    canvas = {};
-    picky.RunAll();
 }
 
 } // namespace

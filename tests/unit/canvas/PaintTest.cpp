@@ -7,21 +7,6 @@ namespace {
 
 using Color = Vector4<float>;
 
-TEST(PaintTest, ANewPaintIsOpaqueWhiteFilledAndPlain) {
-    MKPaint const paint;
-    EXPECT_EQ(paint.GetColor(), Color(1, 1, 1, 1));
-    EXPECT_EQ(paint.GetTintColor(), Color(0, 0, 0, 0));
-    EXPECT_FALSE(paint.HasTintColor());
-    EXPECT_EQ(paint.GetXFermode(), 12);
-    EXPECT_EQ(paint.GetStyle(), 0);
-    EXPECT_EQ(paint.GetLineWidth(), 1.0f);
-    EXPECT_FALSE(paint.IsAntiAliasing());
-    EXPECT_EQ(paint.GetDashedLinePattern(), Color(-1, -1, -1, -1));
-    EXPECT_EQ(paint.GetLineCapType(), 0);
-    EXPECT_EQ(paint.GetTileModeX(), 0);
-    EXPECT_EQ(paint.GetTileModeY(), 0);
-}
-
 TEST(PaintTest, ColoursUnpackFromArgbAndThreeComponentsKeepTheAlpha) {
     MKPaint paint;
     paint.SetColor(static_cast<int>(0x80FF0000u));

@@ -103,24 +103,5 @@ TEST_F(PenCanvas, OnAScreenBitmapOnlyItsLocalStateWorks) {
     }
 }
 
-TEST_F(PenCanvas, WithoutAFrameBufferNoClipIsMadeAndEachEnableSaysSo) {
-    target = NewBitmap(kMaxSide + 1, 10); // too wide
-    auto const pen = NewPenCanvas(target);
-    pen->PreRotate(10);
-    pen->SetClipRect(1, 2, 20, 7, IMKCanvasBase::Intersect);
-    queue.RunAll();
-    OnRenderThread const here;
-    log.Clear();
-    RendererTrace::TakeEvents();
-    for (int enables = 1; enables <= 2; ++enables) {
-        pen->EnableClipRT(0);
-        EXPECT_FALSE(RendererTrace::GetState().stencilClip);
-        pen->DisableClipRT();
-        EXPECT_THAT(log.GetTexts(ANDROID_LOG_ERROR), SizeIs(enables));
-    }
-    EXPECT_THAT(log.GetTexts(ANDROID_LOG_ERROR), Contains(HasSubstr("no frame buffer")).Times(2));
-    EXPECT_THAT(RendererTrace::TakeEvents(), SizeIs(0));
-}
-
 } // namespace
 } // namespace Moka::Testing

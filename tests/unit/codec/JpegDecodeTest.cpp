@@ -66,34 +66,5 @@ TEST(JpegDecode, LongHeadersAreReadToTheirEndAndPreviewsDoNotCountAsIt) {
     EXPECT_THAT(errors.Take(), ElementsAre(HasSubstr("truncated")));
 }
 
-TEST(JpegDecode, HarmlessWarningsPassAndGuessedPixelsDoNot) {
-    ErrorLines errors;
-    Picture const image = MakeOpaqueNoise(64, 64);
-    Bytes const good = MakeJpeg(image.pixels, 64, 64, TJPF_RGBA, TJSAMP_444);
-    Picture const decoded = Decode(good);
-    EXPECT_EQ(Decode(Insert(good, good.size() - 2, {0x11, 0x22, 0x33})), decoded) << "before the end";
-    EXPECT_EQ(Decode(Insert(good, good.size(), Bytes(1000, 0x55))), decoded) << "behind the end";
-    EXPECT_TRUE(errors.Take().empty());
-    Bytes cut(good.begin(), good.end() - static_cast<std::ptrdiff_t>(good.size() * 4 / 10));
-    if (cut.back() == 0xFF) cut.pop_back();
-    EXPECT_TRUE(Decode(Insert(cut, cut.size(), {0xFF, 0xD9})).pixels.empty()) << "an end marker too early";
-    EXPECT_THAT(errors.Take(), ElementsAre(HasSubstr("premature end")));
-}
-
-TEST(JpegDecode, SubsamplingThatHasNoNameDecodes) {
-    ErrorLines const errors;
-    // Middle grey, brightness three times as wide as colour. In every block the difference is 0 and nothing
-    // follows, 00 1010 in the brightness tables, which all components are made to use: 5 blocks, 4 bytes.
-    Bytes file = MakeJpeg(Repeat(24 * 8, {128, 128, 128}), 24, 8, TJPF_RGB, TJSAMP_444);
-    std::size_t const frame = Find(file, {0xFF, 0xC0});
-    ASSERT_EQ(file[frame + 11], 0x11);
-    file[frame + 11] = 0x31;
-    std::size_t const scan = Find(file, {0xFF, 0xDA});
-    file[scan + 6] = file[scan + 8] = file[scan + 10] = 0;
-    file.resize(scan + 14);
-    file = Insert(file, file.size(), {0x28, 0xA2, 0x8A, 0x2B, 0xFF, 0xD9});
-    EXPECT_EQ(Decode(file).pixels, Repeat(24 * 8, {128, 128, 128, 255}));
-}
-
 } // namespace
 } // namespace Moka::Testing

@@ -1,23 +1,16 @@
-// Bitmaps: texture coordinates, batches, and the copy of the destination that darken and lighten need.
+// Bitmaps: what the pictures do not show.
 #include "moka/graphics/bitmap/IMKBitmapReadable.h"
-#include "moka/graphics/bitmap/IMKSubBitmap.h"
-#include "moka/graphics/bitmap/IMKTextureBitmap.h"
 #include "moka/graphics/drawable/MKBitmapDrawable.h"
 #include "moka/graphics/factory/MKGraphicsFactory.h"
-#include "moka/renderer/IRenderTarget.h"
-#include "moka/renderer/ITextureObject.h"
 #include "tests/support/Queues.h"
 #include "tests/unit/drawable/DrawableFixture.h"
 
-#include <array>
 #include <optional>
 
 namespace Moka::Testing {
 namespace {
 
 using ::testing::ElementsAre;
-using ::testing::IsEmpty;
-using ::testing::SizeIs;
 
 class BitmapDrawableTest : public DrawableFixture {
 protected:
@@ -36,24 +29,14 @@ protected:
         DrawableFixture::TearDown();
     }
 
-    bool Draw(RectF const& dst, MKPaint const& paint, RectF const& target = {0, 0, 100, 50}) {
-        return drawable->DrawBitmapRT(readable, RectF(0, 0, 8, 4), target, RectF(2, 1, 6, 3), dst, projection,
-                                      paint);
-    }
-    bool DrawBatch(std::vector<RectF> const& dsts, MKPaint const& paint,
-                   RectF const& target = {0, 0, 100, 50}) {
-        return drawable->DrawBitmapsRT(readable, RectF(0, 0, 8, 4), target, RectF(2, 1, 6, 3), &dsts,
-                                       projection, paint);
-    }
-
-    // What was done to textures other than the bitmap's own, without their parameters.
-    static std::vector<std::string> TakeTextureCalls() {
-        std::vector<std::string> calls;
-        for (std::string const& call : RendererTrace::TakeCalls())
-            if (call.rfind("texture", 0) == 0 && call.rfind("texture 1 ", 0) != 0 &&
-                call.find("SetParameter") == std::string::npos)
-                calls.push_back(call);
-        return calls;
+    // Alone and in a batch.
+    std::vector<TracedDraw> Draw(RectF const& bounds, RectF const& src, MKPaint const& paint) {
+        std::vector<RectF> const dsts = {RectF(0, 0, 5, 5)};
+        EXPECT_TRUE(drawable->DrawBitmapRT(readable, bounds, bounds, src, dsts[0], projection, paint));
+        EXPECT_TRUE(drawable->DrawBitmapsRT(readable, bounds, bounds, src, &dsts, projection, paint));
+        std::vector<TracedDraw> draws = TakeDraws();
+        EXPECT_EQ(draws.size(), 2u);
+        return draws;
     }
 
     HandPumpedQueue queue;
@@ -62,174 +45,29 @@ protected:
     std::optional<MKBitmapDrawable> drawable;
 };
 
-TEST_F(BitmapDrawableTest, TheCornersCarryTheCornersOfTheSource) {
-    EXPECT_TRUE(Draw(RectF(10, 20, 30, 28), MKPaint()));
-    EXPECT_THAT(VerticesOf(TakeDraw()),
-                ElementsAre(Vertex{10, 20, 1, 0.25f, 0.25f}, Vertex{10, 28, 1, 0.25f, 0.75f},
-                            Vertex{30, 20, 1, 0.75f, 0.25f}, Vertex{30, 20, 1, 0.75f, 0.25f},
-                            Vertex{10, 28, 1, 0.25f, 0.75f}, Vertex{30, 28, 1, 0.75f, 0.75f}));
-
-    MKPaint soft; // a fringe does not stretch the texture
-    soft.SetAntiAliasing(true);
-    EXPECT_TRUE(Draw(RectF(3.5f, 4, 12, 10.25f), soft));
-    std::vector<Vertex> const vertices = VerticesOf(TakeDraw());
-    EXPECT_THAT(vertices, SizeIs(30));
-    for (Vertex const& v : vertices) {
-        EXPECT_EQ(v[3], v[0] < 7 ? 0.25f : 0.75f);
-        EXPECT_EQ(v[4], v[1] < 7 ? 0.25f : 0.75f);
-    }
-
-    // A bitmap that does not lie at the origin: its left edge is added on the right.
-    RectF const bounds(10, 20, 18, 24);
-    std::vector<RectF> const dsts = {RectF(0, 0, 5, 5)};
-    EXPECT_TRUE(drawable->DrawBitmapRT(readable, bounds, bounds, RectF(12, 21, 16, 23), dsts[0], projection,
-                                       MKPaint()));
-    EXPECT_TRUE(drawable->DrawBitmapsRT(readable, bounds, bounds, RectF(12, 21, 16, 23), &dsts, projection,
-                                        MKPaint()));
-    for (TracedDraw const& shifted : TakeDraws()) {
+// Its left edge is added on the right.
+TEST_F(BitmapDrawableTest, ABitmapThatDoesNotLieAtTheOriginIsStretched) {
+    for (TracedDraw const& shifted : Draw(RectF(10, 20, 18, 24), RectF(12, 21, 16, 23), MKPaint())) {
         EXPECT_THAT(VerticesOf(shifted).front(), ElementsAre(0, 0, 1, 0.25f, 0.25f));
         EXPECT_THAT(VerticesOf(shifted).back(), ElementsAre(5, 5, 1, (16.0f + 10.0f) / 8.0f, 0.75f));
     }
 }
 
-TEST_F(BitmapDrawableTest, ABatchIsTheSameVerticesInOneDraw) {
-    std::vector<RectF> const dsts = {RectF(0, 0, 5, 5), RectF(30, 0, 20, 5), RectF(1, 2, 3, 4)};
-    for (bool antiAliased : {false, true}) {
-        MKPaint paint;
-        paint.SetAntiAliasing(antiAliased);
-        std::vector<float> expected;
-        for (RectF const& dst : dsts) {
-            EXPECT_TRUE(Draw(dst, paint));
-            std::vector<float> const one = TakeDraw().vertices;
-            expected.insert(expected.end(), one.begin(), one.end());
-        }
-        EXPECT_TRUE(DrawBatch(dsts, paint));
-        TracedDraw const batch = TakeDraw();
-        EXPECT_EQ(batch.count, antiAliased ? 90 : 18);
-        EXPECT_EQ(batch.vertices, expected);
-    }
-    // Nothing of the last batch is left over.
-    EXPECT_TRUE(DrawBatch({}, MKPaint()));
-    EXPECT_THAT(TakeDraw().vertices, IsEmpty());
-}
-
 TEST_F(BitmapDrawableTest, TheDrawUsesThePaintAndTheBitmapAndLeavesTheStencilAlone) {
-    MKPaint paint = CommonPaint();
-    ForceOtherStates();
-    EXPECT_TRUE(Draw(RectF(0, 0, 5, 5), paint));
-    EXPECT_TRUE(DrawBatch({RectF(0, 0, 5, 5)}, paint));
-    std::vector<TracedDraw> const draws = TakeDraws();
-    EXPECT_THAT(draws, SizeIs(2));
-    for (TracedDraw const& draw : draws) {
-        ExpectCommonState(draw);
-        EXPECT_TRUE(draw.state.depthStencil.IsStencil());
-        EXPECT_EQ(draw.textures.at(0), "texture 1");
-        EXPECT_EQ(Values(draw, {"uSrcTexture"}), "0");
-    }
-}
-
-TEST_F(BitmapDrawableTest, OnlyOneGpuGetsTheProgramThatClampsColors) {
+    // One GPU gets a program that clamps colours.
     for (std::string const gpu : {"Mali-T830", "Mali-T830 MP2", "Mali-T83"}) {
         RendererTrace::SetGpuName(gpu.c_str());
         drawable.reset();
-        RendererTrace::TakeCalls();
         drawable.emplace(&queue);
-        char const* const program = gpu == "Mali-T830" ? "MKBitmapShaderColorClamp" : "MKBitmapShader";
-        std::vector<std::string> programs;
-        for (TracedCall const& call : RendererTrace::GetCalls()) {
-            if (call.operation == "Create" && call.object.rfind("program", 0) == 0)
-                programs.push_back(call.arguments);
-        }
-        EXPECT_THAT(programs, ElementsAre(program, "MKBitmapAdvancedBlendingShader"));
         ForceOtherStates();
-        EXPECT_TRUE(Draw(RectF(0, 0, 5, 5), CommonPaint()));
-        EXPECT_TRUE(DrawBatch({RectF(0, 0, 5, 5)}, CommonPaint()));
-        for (TracedDraw const& draw : TakeDraws()) {
-            EXPECT_EQ(draw.shader, program);
+        for (TracedDraw const& draw : Draw(RectF(0, 0, 8, 4), RectF(2, 1, 6, 3), CommonPaint())) {
+            EXPECT_EQ(draw.shader, gpu == "Mali-T830" ? "MKBitmapShaderColorClamp" : "MKBitmapShader");
             ExpectCommonState(draw);
+            EXPECT_TRUE(draw.state.depthStencil.IsStencil());
+            EXPECT_EQ(draw.textures.at(0), "texture 1");
+            EXPECT_EQ(Values(draw, {"uSrcTexture"}), "0");
         }
     }
-}
-
-TEST_F(BitmapDrawableTest, EachAxisWrapsAsThePaintSaysAndAnUnknownModeLeavesItAlone) {
-    ITextureObject const* const texture = bitmap->GetTextureBitmap()->GetSubBitmap(0)->GetTexture();
-    auto const wrap = [&](int x, int y) {
-        MKPaint paint;
-        paint.SetTileMode(static_cast<MKPaint::TileMode>(x), static_cast<MKPaint::TileMode>(y));
-        Draw(RectF(0, 0, 5, 5), paint);
-        return std::array<int, 2>{RendererTrace::GetParameter(texture, 0),
-                                  RendererTrace::GetParameter(texture, 1)};
-    };
-    EXPECT_THAT(wrap(2, 3), ElementsAre(3, 0));
-    EXPECT_THAT(wrap(4, 0), ElementsAre(3, 1));
-    EXPECT_THAT(wrap(3, -1), ElementsAre(0, 1));
-    EXPECT_THAT(wrap(1, 2), ElementsAre(1, 3));
-}
-
-TEST_F(BitmapDrawableTest, DarkenAndLightenSampleACopyOfTheDestinationMadeOnceASize) {
-    MKPaint paint = CommonPaint();
-    paint.SetXFermode(MKPaint::Darken);
-    std::string const tag = "MKBitmapDrawable::DrawBitmapRT mDstBitmapForAdvancedBlending";
-    EXPECT_TRUE(Draw(RectF(0, 0, 5, 5), paint));
-    EXPECT_THAT(TakeTextureCalls(), ElementsAre("texture 2 Create 100 50", "texture 2 SetLabel " + tag,
-                                                "texture 2 CopyFromRenderTarget", "texture 2 Bind 1"));
-    EXPECT_EQ(Values(TakeDraw(), {"uSrcTexture", "uDstTexture", "uDstTextureSize", "uBlendingMode"}),
-              "0 | 1 | 100 50 | 1");
-
-    // Only the size of the target counts, and both calls share the copy.
-    paint.SetXFermode(MKPaint::Lighten);
-    EXPECT_TRUE(DrawBatch({RectF(0, 0, 5, 5)}, paint, RectF(40, 30, 140, 80)));
-    EXPECT_THAT(TakeTextureCalls(), ElementsAre("texture 2 CopyFromRenderTarget", "texture 2 Bind 1"));
-    EXPECT_EQ(Values(TakeDraw(), {"uBlendingMode"}), "2");
-
-    EXPECT_TRUE(DrawBatch({RectF(0, 0, 5, 5)}, paint, RectF(0, 0, 101, 50)));
-    EXPECT_THAT(TakeTextureCalls(), ElementsAre("texture 2 Release", "texture 3 Create 101 50",
-                                                "texture 3 SetLabel " + tag + " 1",
-                                                "texture 3 CopyFromRenderTarget", "texture 3 Bind 1"));
-}
-
-TEST_F(BitmapDrawableTest, TheSizeOfTheDestinationIsSetBeforeTheTintsSwitch) {
-    MKPaint paint;
-    paint.SetXFermode(MKPaint::Darken);
-    Draw(RectF(0, 0, 5, 5), paint);
-    std::string values;
-    for (TracedCall const& call : RendererTrace::GetCalls())
-        if (call.operation == "SetParameter" && call.object == "program 2")
-            values += call.arguments.substr(0, call.arguments.find(' ') + 1);
-    EXPECT_EQ(values, "uProjectionMatrix uColor uTintColor uDstTextureSize uHasTintColor uBlendingMode "
-                      "uSrcTexture uDstTexture ");
-}
-
-TEST_F(BitmapDrawableTest, ItReleasesGeometryStatesProgramsAndCopyInThatOrder) {
-    MKPaint paint;
-    paint.SetXFermode(MKPaint::Darken);
-    Draw(RectF(0, 0, 5, 5), paint);
-    RendererTrace::TakeCalls();
-    drawable.reset();
-    EXPECT_THAT(TakeObjects("Release"), ElementsAre("graphics 1", "blend 1", "depthstencil 1", "program 1",
-                                                    "program 2", "texture 2"));
-}
-
-TEST_F(BitmapDrawableTest, WithoutACopyOfTheDestinationNothingIsDrawn) {
-    MKPaint paint;
-    paint.SetXFermode(MKPaint::Darken);
-    for (float const size : {kNaN, kInfinity, -kInfinity, 3e9f, 0.0f, 0.5f, -5.0f})
-        EXPECT_FALSE(Draw(RectF(0, 0, 5, 5), paint, RectF(0, 0, size, 10))) << size;
-    RendererTrace::FailCreations(ObjectKind::kTexture);
-    EXPECT_FALSE(Draw(RectF(0, 0, 5, 5), paint));
-    RendererTrace::StopFailing();
-    EXPECT_THAT(TakeDraws(), IsEmpty());
-    EXPECT_TRUE(Draw(RectF(0, 0, 5, 5), paint, RectF(0, 0, 20, 10)));
-}
-
-TEST_F(BitmapDrawableTest, BadInputDrawsNothingOrDoesNoHarm) {
-    std::vector<RectF> const dsts = {RectF(0, 0, kNaN, kInfinity)};
-    RectF const r(0, 0, 8, 4);
-    EXPECT_FALSE(drawable->DrawBitmapRT(nullptr, r, r, r, r, projection, MKPaint()));
-    EXPECT_FALSE(drawable->DrawBitmapsRT(nullptr, r, r, r, &dsts, projection, MKPaint()));
-    EXPECT_FALSE(drawable->DrawBitmapsRT(readable, r, r, r, nullptr, projection, MKPaint()));
-    EXPECT_THAT(TakeDraws(), IsEmpty());
-    EXPECT_TRUE(drawable->DrawBitmapsRT(readable, RectF(), r, dsts[0], &dsts, projection, MKPaint()));
 }
 
 } // namespace

@@ -45,15 +45,6 @@ inline MKPaint CommonPaint() {
     return paint;
 }
 
-// The objects that were made, or released, since the calls were last taken, in their order.
-inline std::vector<std::string> TakeObjects(std::string const& operation) {
-    std::vector<std::string> objects;
-    for (TracedCall const& call : RendererTrace::GetCalls())
-        if (call.operation == operation) objects.push_back(call.object);
-    RendererTrace::TakeCalls();
-    return objects;
-}
-
 // A stencil test, as a clip leaves it, and no blending.
 inline void ForceOtherStates() {
     IBlendStateObject* const blend = RendererFactory::CreateBlendStateObject(BlendStateDescriptor(false));

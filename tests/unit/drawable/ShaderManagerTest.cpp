@@ -1,11 +1,11 @@
 #include "moka/graphics/drawable/ShaderExceptions.h"
-#include "tests/support/Allocation.h"
+#include "tests/support/Awaited.h"
 #include "tests/unit/drawable/ShaderFixture.h"
 
 #include <atomic>
 #include <chrono>
-#include <cstdlib>
-#include <new>
+#include <filesystem>
+#include <fstream>
 #include <thread>
 
 namespace Moka::Testing {
@@ -19,6 +19,20 @@ namespace Moka::Testing {
 MOKA_SHADER_CLASS(WrongShader, WRONG_UNIFORMS)
 MOKA_SHADER_DEFINITION(WrongShader, WRONG_UNIFORMS, "uniform mat4 first; uniform int wrong;",
                        "uniform int after;")
+
+#define EVERY_KIND_UNIFORMS(U)                                                                               \
+    U(Bool, flag)                                                                                            \
+    U(Matrix4, matrix)                                                                                       \
+    U(Vector2, pair)                                                                                         \
+    U(Vector4, color)                                                                                        \
+    U(Float, number)                                                                                         \
+    U(Int, count)                                                                                            \
+    U(TextureUnit, texture)                                                                                  \
+    U(Vector4, missing)
+MOKA_SHADER_CLASS(EveryKindShader, EVERY_KIND_UNIFORMS)
+MOKA_SHADER_DEFINITION(EveryKindShader, EVERY_KIND_UNIFORMS, "uniform mat4 matrix; attribute vec4 missing;",
+                       "uniform bool flag; uniform vec2 pair; uniform vec4 color; uniform float number;"
+                       "uniform int count; uniform sampler2D texture;")
 
 namespace {
 
@@ -86,20 +100,6 @@ TEST_F(ShaderManagerTest, GivingBackWhatIsNotTheManagersChangesNothing) {
     EXPECT_EQ(CountPrograms(), 0);
 }
 
-TEST_F(ShaderManagerTest, RemovingForgetsTheShaderWithoutDestroyingIt) {
-    auto* const shader = manager.GetShader<MKRectShader>();
-    log.Clear();
-    manager.RemoveShader(ShaderManager::Key("no such class"));
-    EXPECT_EQ(manager.GetShader<MKRectShader>(), shader);
-    manager.RemoveShader(ShaderManager::Key(typeid(MKRectShader).name()));
-    EXPECT_THAT(log.GetTexts(), IsEmpty());
-    EXPECT_EQ(CountPrograms(), 1);
-    auto* const next = manager.GetShader<MKRectShader>();
-    EXPECT_NE(next, shader);
-    manager.ReleaseShader(next);
-    delete shader;
-}
-
 TEST_F(ShaderManagerTest, AWrongTypeStopsTheConstructionAndLeavesNoEntry) {
     auto* const bystander = manager.GetShader<MKCircleShader>();
     for (int attempt = 0; attempt < 2; ++attempt) {
@@ -129,55 +129,59 @@ TEST_F(ShaderManagerTest, AWrongTypeStopsTheConstructionAndLeavesNoEntry) {
     expectedAlive += 2;
 }
 
-struct NoMemoryShader {
-    NoMemoryShader() { ADD_FAILURE() << "constructed in no memory"; }
-    static void* operator new(std::size_t, std::nothrow_t const&) noexcept { return nullptr; }
-    static void operator delete(void* memory) { ::operator delete(memory); }
-};
-
-TEST_F(ShaderManagerTest, WithoutMemoryTheEntryIsThereAndTheShaderIsNull) {
-    EXPECT_EQ(manager.GetShader<NoMemoryShader>(), nullptr);
-    log.Clear();
-    EXPECT_EQ(manager.GetShader<NoMemoryShader>(), nullptr);
+TEST_F(ShaderManagerTest, AssignedValuesReachTheProgramAndMissingUniformsSwallowThem) {
+    {
+        RendererTrace::TakeCalls();
+        EveryKindShader shader;
+        std::string const get = "program 1 GetParameter ";
+        EXPECT_THAT(RendererTrace::TakeCalls(),
+                    ElementsAre("program 1 Create EveryKindShader", get + "flag 1", get + "matrix 2",
+                                get + "pair 3", get + "color 5", get + "number 6", get + "count 7",
+                                get + "texture 8", get + "missing 0"));
+        shader.program->MakeCurrent();
+        shader.flag = true;
+        shader.matrix = Matrix4<float>(1, 2, 3, 4, 5, 6, 7, 8, 9, 10, 11, 12, 13, 14, 15, 16);
+        shader.pair = Vector2<float>(0.5f, -1);
+        shader.color = Vector4<float>(1, 0.25f, 0, 1);
+        shader.number = 2.5f;
+        shader.count = -3;
+        (shader.texture = 1) = 2; // the assignment gives the binding back
+        shader.missing = Vector4<float>();
+        auto const value = [&](char const* name) {
+            return RendererTrace::GetParameter(shader.program, name);
+        };
+        EXPECT_EQ(value("flag"), "1");
+        EXPECT_EQ(value("matrix"), "1 2 3 4 5 6 7 8 9 10 11 12 13 14 15 16");
+        EXPECT_EQ(value("pair"), "0.5 -1");
+        EXPECT_EQ(value("color"), "1 0.25 0 1");
+        EXPECT_EQ(value("number"), "2.5");
+        EXPECT_EQ(value("count"), "-3");
+        EXPECT_EQ(value("texture"), "2");
+        EXPECT_EQ(RendererTrace::CountCalls("SetParameter"), 9);
+        RendererTrace::TakeCalls();
+    }
+    std::vector<std::string> const calls = RendererTrace::TakeCalls(); // backwards
+    EXPECT_EQ(calls.front(), "program 1 Release");
+    EXPECT_EQ(calls.back(), "program 1 ReleaseParameter flag");
     EXPECT_THAT(log.GetTexts(), IsEmpty());
-    manager.RemoveShader(ShaderManager::Key(typeid(NoMemoryShader).name()));
 }
 
-// Has memory of its own, so that only the manager runs out of it.
-struct FrugalShader {
-    FrugalShader() { ++alive; }
-    ~FrugalShader() { --alive; }
-    static void* operator new(std::size_t size, std::nothrow_t const&) noexcept { return std::malloc(size); }
-    static void operator delete(void* memory) { std::free(memory); }
-    static inline int alive = 0;
-};
-
-TEST_F(ShaderManagerTest, WithoutMemoryForTheEntryThereIsNeitherItNorAShader) {
-    FrugalShader* shader = nullptr;
-    EXPECT_NO_THROW({
-        FailAllocations const noMemory;
-        shader = manager.GetShader<FrugalShader>();
-    });
-    EXPECT_EQ(shader, nullptr);
-    EXPECT_EQ(FrugalShader::alive, 0);
-    shader = manager.GetShader<FrugalShader>();
-    EXPECT_NE(shader, nullptr);
-    manager.ReleaseShader(shader);
-    EXPECT_EQ(FrugalShader::alive, 0);
-}
-
-TEST_F(ShaderManagerTest, AMistakeIsToldInNoMemoryAsWell) {
-    std::string told;
-    told.reserve(100);
-    EXPECT_NO_THROW({
-        FailAllocations const noMemory;
-        try {
-            ParameterBinding<BindingTypeInt>() = 1;
-        } catch (NotSupportedException const& error) {
-            told = error.what();
+// Where a mediump float has 16 bits a place above 1024 is known to a whole unit, and a wide bitmap skips texels.
+TEST(ShaderPrecision, WhatIsInterpolatedIsOfHighPrecisionInEveryFragmentStage) {
+    int varyings = 0;
+    for (auto const& entry : std::filesystem::directory_iterator(MOKA_SHADER_FOLDER)) {
+        if (entry.path().extension() != ".frag") continue;
+        std::ifstream file(entry.path());
+        bool isDefault = false;
+        for (std::string line; std::getline(file, line);) {
+            isDefault = isDefault || line == "precision highp float;";
+            if (line.rfind("varying ", 0) != 0 && line.rfind("in ", 0) != 0) continue;
+            ++varyings;
+            EXPECT_TRUE(isDefault || line.find(" highp ") != std::string::npos)
+                << entry.path() << ": " << line;
         }
-    });
-    EXPECT_EQ(told, "ParameterBinding: internal interface is not initialized!");
+    }
+    EXPECT_EQ(varyings, 15);
 }
 
 struct SlowShader {
@@ -196,12 +200,13 @@ TEST(ShaderManagerThreadsTest, UsersOnManyThreadsNeverMeetTwoOfAClass) {
     ShaderManager& manager = *ShaderManager::GetInstance();
     for (int round = 0; round < 5; ++round) {
         int const before = SlowShader::made;
-        std::atomic<int> waiting{4};
-        std::vector<std::thread> users;
+        Awaited<int> users;
+        std::vector<std::thread> threads;
         for (int i = 0; i < 4; ++i) {
-            users.emplace_back([&] {
+            threads.emplace_back([&] {
                 SlowShader* const mine = manager.GetShader<SlowShader>();
-                for (--waiting; waiting > 0;) std::this_thread::yield();
+                ++users;
+                users.AwaitAtLeast(4);
                 for (int j = 0; j < 50; ++j) {
                     EXPECT_EQ(manager.GetShader<SlowShader>(), mine);
                     EXPECT_EQ(SlowShader::alive, 1);
@@ -210,7 +215,7 @@ TEST(ShaderManagerThreadsTest, UsersOnManyThreadsNeverMeetTwoOfAClass) {
                 manager.ReleaseShader(mine);
             });
         }
-        for (std::thread& user : users) user.join();
+        for (std::thread& thread : threads) thread.join();
         EXPECT_EQ(SlowShader::made, before + 1);
         EXPECT_EQ(SlowShader::alive, 0);
     }

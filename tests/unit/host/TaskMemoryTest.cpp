@@ -1,18 +1,14 @@
 #include "moka/graphics/task/TaskMemory.h"
 
 #include "moka/graphics/task/ITask.h"
+#include "tests/support/Awaited.h"
 
 #include <gtest/gtest.h>
 
 #include <algorithm>
-#include <array>
-#include <atomic>
 #include <cstdint>
 #include <cstring>
-#include <mutex>
-#include <new>
 #include <set>
-#include <stdexcept>
 #include <thread>
 #include <vector>
 
@@ -56,42 +52,6 @@ TEST(TaskMemoryTest, GivesBlocksOfTheirOwnOnCacheLinesOfTheirOwn) {
     FreeTask(nullptr);
 }
 
-TEST(TaskMemoryTest, BlocksFreedOnAnotherThreadAreIntactAndComeBackOnce) {
-    constexpr int kBlocks = 20000;
-    std::atomic<int> broken{0};
-    // One thread fills blocks, another one frees them.
-    auto const exchange = [&broken](int pair) {
-        std::mutex mutex;
-        std::vector<Block> filled;
-        std::thread filler([&] {
-            for (int i = 0; i < kBlocks; ++i) {
-                std::size_t const size = kSizes[static_cast<std::size_t>(i + pair) % std::size(kSizes)];
-                Block const block = Block::Make(size, static_cast<unsigned char>(3 * i + pair));
-                std::lock_guard<std::mutex> const lock(mutex);
-                filled.push_back(block);
-            }
-        });
-        for (int freed = 0; freed < kBlocks;) {
-            std::vector<Block> taken;
-            {
-                std::lock_guard<std::mutex> const lock(mutex);
-                taken.swap(filled);
-            }
-            for (Block const& block : taken) {
-                if (!block.IsIntact()) ++broken;
-                block.Free();
-            }
-            freed += static_cast<int>(taken.size());
-            if (taken.empty()) std::this_thread::yield();
-        }
-        filler.join();
-    };
-    std::vector<std::thread> threads;
-    for (int pair = 0; pair < 3; ++pair) threads.emplace_back(exchange, pair);
-    for (std::thread& thread : threads) thread.join();
-    EXPECT_EQ(broken, 0);
-}
-
 #if !defined(__SANITIZE_ADDRESS__)
 TEST(TaskMemoryTest, AThreadThatEndsLeavesItsBlocksToOthers) {
     constexpr std::size_t kSize = 200;
@@ -115,13 +75,10 @@ TEST(TaskMemoryTest, AOneWayStreamReusesItsBlocks) {
     constexpr int kRounds = 50;
     std::set<void*> seen;
     std::vector<void*> blocks;
-    std::atomic<int> turn{0}; // odd: the other thread's
-    auto const await = [&turn](int wanted) {
-        while (turn != wanted) std::this_thread::yield();
-    };
+    Awaited<int> turn; // odd: the other thread's
     std::thread consumer([&] {
         for (int round = 0; round < kRounds; ++round) {
-            await(2 * round + 1);
+            turn.AwaitAtLeast(2 * round + 1);
             for (void* const block : blocks) FreeTask(block, kSize);
             ++turn;
         }
@@ -131,7 +88,7 @@ TEST(TaskMemoryTest, AOneWayStreamReusesItsBlocks) {
         for (int i = 0; i < 100; ++i) blocks.push_back(AllocateTask(kSize));
         seen.insert(blocks.begin(), blocks.end());
         ++turn;
-        await(2 * round + 2);
+        turn.AwaitAtLeast(2 * round + 2);
     }
     consumer.join();
     EXPECT_LE(seen.size(), 300u);
@@ -164,32 +121,6 @@ TEST(TaskMemoryTest, AThreadThatIsBeingTornDownGetsBlocksAndGivesThemBack) {
     ASSERT_FALSE(seen.empty());
 #if !defined(__SANITIZE_ADDRESS__)
     EXPECT_LE(seen.size(), 2u * detail::kTaskBatch);
-#endif
-}
-
-// Posted work may die with the statics of the process; a crash here fails the test program.
-struct StaticUser {
-    ~StaticUser() { Block::Make(100, 1).Free(); }
-} theStaticUser;
-
-template <std::size_t kBytes>
-struct ThrowingTask : ITask {
-    ThrowingTask() { throw std::runtime_error("no"); }
-    void run() override {}
-    std::array<char, kBytes> payload;
-};
-
-// The memory must come back, which the leak sanitizer sees, and the next one of that size gets it.
-TEST(TaskMemoryTest, ATaskWhoseConstructorThrowsGivesItsMemoryBack) {
-    EXPECT_THROW((void)new (std::nothrow) ThrowingTask<100>, std::runtime_error);
-    EXPECT_THROW((void)new (std::nothrow) ThrowingTask<1000>, std::runtime_error);
-#if !defined(__SANITIZE_ADDRESS__)
-    void* const before = AllocateTask(sizeof(ThrowingTask<100>));
-    FreeTask(before, sizeof(ThrowingTask<100>));
-    EXPECT_THROW((void)new (std::nothrow) ThrowingTask<100>, std::runtime_error);
-    void* const after = AllocateTask(sizeof(ThrowingTask<100>));
-    EXPECT_EQ(before, after);
-    FreeTask(after, sizeof(ThrowingTask<100>));
 #endif
 }
 

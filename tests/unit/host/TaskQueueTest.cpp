@@ -1,4 +1,5 @@
 #include "moka/base/log/AndroidLog.h"
+#include "tests/support/Awaited.h"
 #include "tests/support/LogCapture.h"
 #include "tests/unit/host/QueueThread.h"
 
@@ -46,25 +47,6 @@ TEST_F(TaskQueueTest, RunsEachProducersTasksInOrderAndWaitingSeesThem) {
     for (std::thread& producer : producers) producer.join();
 }
 
-TEST_F(TaskQueueTest, CallsIdleAfterTheQueueHasRunEmptyAndTakesWhatThatPosts) {
-    std::vector<std::string> events;
-    QueueThread queue;
-    auto const note = [&events](char const* what) {
-        return MakeTask([&events, what] { events.push_back(what); });
-    };
-    queue.Post(note("first"));
-    queue.Post(MakeTask([&] {
-        events.push_back("second");
-        queue.Post(note("posted by second"));
-    }));
-    queue.RequestStop();
-    queue.Run([&, posted = false]() mutable {
-        events.push_back("idle");
-        if (!std::exchange(posted, true)) queue.Post(note("posted by idle"));
-    });
-    EXPECT_THAT(events, ElementsAre("first", "second", "posted by second", "idle", "posted by idle", "idle"));
-}
-
 TEST_F(TaskQueueTest, StoppingRunsWhatTasksPostAndThenRefuses) {
     int chain = 0;
     std::unique_ptr<QueueThread> queue = std::make_unique<QueueThread>();
@@ -93,7 +75,7 @@ TEST_F(TaskQueueTest, StoppingRunsWhatTasksPostAndThenRefuses) {
 TEST_F(TaskQueueTest, RunsOrRefusesEveryTaskThatRacesWithStop) {
     for (int round = 0; round < 20; ++round) {
         std::atomic<int> accepted{0};
-        std::atomic<int> ran{0};
+        Awaited<int> ran;
         QueueThread queue;
         queue.Start();
         std::vector<std::thread> producers;
@@ -109,35 +91,37 @@ TEST_F(TaskQueueTest, RunsOrRefusesEveryTaskThatRacesWithStop) {
                 }
             });
         }
-        while (ran < 20) std::this_thread::yield();
+        ran.AwaitAtLeast(20);
         queue.Stop();
         for (std::thread& producer : producers) producer.join();
-        EXPECT_EQ(ran, accepted);
+        EXPECT_EQ(ran.Get(), accepted);
         EXPECT_EQ(FunctionTask::CountAlive(), 0);
     }
 }
 
 TEST_F(TaskQueueTest, DestructionFreesWhatNobodyRanAndLetsWaitersGo) {
     bool ran = false;
-    auto queue = std::make_unique<QueueThread>();
-    EXPECT_FALSE(queue->Post(nullptr));
-    queue->WaitForTasks(); // nothing was posted, so nobody need run
-    for (int i = 0; i < 10; ++i) queue->Post(MakeTask([&ran] { ran = true; }));
-    std::atomic<int> started{0};
-    std::vector<std::thread> waiters;
-    for (int i = 0; i < 4; ++i) {
-        waiters.emplace_back([&started, &queue = *queue] {
-            ++started;
-            queue.WaitForTasks();
-        });
+    for (int round = 0; round < 10; ++round) {
+        auto queue = std::make_unique<QueueThread>();
+        EXPECT_FALSE(queue->Post(nullptr));
+        queue->WaitForTasks(); // nothing was posted, so nobody need run
+        for (int i = 0; i < 10; ++i) queue->Post(MakeTask([&ran] { ran = true; }));
+        Awaited<int> started;
+        std::vector<std::thread> waiters;
+        for (int i = 0; i < 4; ++i) {
+            waiters.emplace_back([&started, &queue = *queue] {
+                ++started;
+                queue.WaitForTasks();
+            });
+        }
+        started.AwaitAtLeast(4);
+        // Long enough for the four to be inside; the test passes when they are not, and then shows less.
+        std::this_thread::sleep_for(std::chrono::milliseconds(10));
+        queue.reset();
+        for (std::thread& waiter : waiters) waiter.join();
+        EXPECT_EQ(FunctionTask::CountAlive(), 0);
     }
-    while (started < 4) std::this_thread::yield();
-    // Long enough for the four to be inside; the test passes when they are not, and then shows less.
-    std::this_thread::sleep_for(std::chrono::milliseconds(50));
-    queue.reset();
-    for (std::thread& waiter : waiters) waiter.join();
     EXPECT_FALSE(ran);
-    EXPECT_EQ(FunctionTask::CountAlive(), 0);
 }
 
 TEST_F(TaskQueueTest, WaitingDoesNotAwaitWhatWasPostedAfter) {

@@ -3,8 +3,6 @@
 
 #include "tests/support/Queues.h"
 
-#include <stdexcept>
-
 namespace Moka::Testing {
 namespace {
 
@@ -40,48 +38,6 @@ TEST_F(Load, PendingThenTheResultThenCompletedForEveryKind) {
     for (char const* result : {"load 1 5x4", "load 2 5x4", "load 3 3x2", "load 4 3x2", "load 5 5x4"})
         expected.insert(expected.end(), {"pending", result, "completed"});
     EXPECT_EQ(listener.GetEvents(), expected);
-}
-
-TEST_F(Load, ATallPictureArrivesWholeAndTagged) {
-    Picture const image = MakeGradient(7, 2 * kMaxSide + 9);
-    String const path = WritePicture("tall.mki", image.width, image.height);
-    RefPtr<IMKBitmap> kept;
-    listener.whenLoaded = [&](Bitmap*, IMKBitmap* bitmap) { kept = RefPtr<IMKBitmap>::Share(bitmap); };
-    Request(1, path, BITMAP_TYPE_GRAPHICS);
-    listener.AwaitCompleted(1);
-    ASSERT_TRUE(kept);
-    EXPECT_STREQ(kept->GetTag(), "BitmapLoaderImpl::LoadBitmap (CreateScaledCPUBitmap)");
-    Pixels pixels(image.pixels.size());
-    kept->GetBitmapData(kept->GetBitmapRect(), pixels.data());
-    EXPECT_EQ(pixels, image.pixels);
-}
-
-TEST_F(Load, LogsEachStep) {
-    System::SetBuildTypeEngMode(true);
-    String const path = WritePicture("a.mki");
-    std::string const text = path.ToUtf8();
-    AwaitIdle();
-    log.Clear();
-    Request(1, path, BITMAP_TYPE_GRAPHICS);
-    log.AwaitLines("BitmapLoaderImpl::EventLoop Wait!");
-    std::string const serial = std::to_string(GetLoggedSerial("BitmapLoaderImpl::AddRequest"));
-    EXPECT_EQ(LinesOf("BitmapLoaderImpl"),
-              (Events{"BitmapLoaderImpl::AddRequest; queue size(1) request[" + serial + "]",
-                      "BitmapLoaderImpl::EventLoop queue size(1)",
-                      "BitmapLoaderImpl::EventLoop process load request[" + serial + "]: " + text,
-                      "BitmapLoaderImpl::LoadBitmap Call OnLoad.",
-                      "BitmapLoaderImpl::LoadBitmap Call OnLoad finish.",
-                      "BitmapLoaderImpl::EventLoop process load request[" + serial + "] done: " + text,
-                      "BitmapLoaderImpl::EventLoop Wait!"}));
-    System::SetBuildTypeEngMode(false);
-    log.Clear();
-    Request(2, Path("missing.mki"), BITMAP_TYPE_GRAPHICS);
-    log.AwaitLines("BitmapLoaderImpl::EventLoop Wait!");
-    EXPECT_EQ(log.Count(ANDROID_LOG_INFO, folder.GetPath().string()), 0)
-        << "paths are for engineering builds";
-    EXPECT_EQ(log.Find("BitmapLoaderImpl::LoadBitmap (CreateScaledCPUBitmap): bitmap is null").priority,
-              ANDROID_LOG_ERROR);
-    EXPECT_TRUE(log.Has("BitmapLoaderImpl::LoadBitmap Call OnLoadError finish."));
 }
 
 TEST_F(Load, AnIdIsRefusedUntilItsDecodeIsCancelledWhichCallsNobody) {
@@ -193,50 +149,6 @@ TEST_F(Load, WhatCannotBeLoadedIsAnErrorAndTheLoopGoesOn) {
     EXPECT_EQ(log.Count(ANDROID_LOG_INFO, "BitmapLoaderImpl::LoadBitmap Call OnLoad finish."), 2);
 }
 
-TEST_F(Load, ALongPathOfAnyTextIsFoundAndItsLogLineCutAtACharacter) {
-    System::SetBuildTypeEngMode(true);
-    std::filesystem::path deep = folder.GetPath();
-    while (deep.native().size() < 700) deep /= "\xe7\xb4\x99\xf0\x9f\x96\x8a\xc3\xa9 folder";
-    std::filesystem::create_directories(deep);
-    String const path = WritePicture(deep / "\xe7\x94\xbb.mki");
-    Request(1, path);
-    listener.AwaitCompleted(1);
-    EXPECT_EQ(listener.GetEvents()[1], "load 1 5x4");
-    std::string shown;
-    for (std::string const& text : LinesOf("BitmapLoaderImpl"))
-        if (text.find("process load request[") != std::string::npos && shown.empty())
-            shown = text.substr(text.find("]: ") + 3);
-    EXPECT_LE(shown.size(), 500u);
-    EXPECT_GT(shown.size(), 496u);
-    EXPECT_EQ(path.ToUtf8().compare(0, shown.size(), shown), 0);
-    EXPECT_EQ(String(shown).ToUtf8(), shown) << "a character was cut in two";
-}
-
-TEST_F(Load, WhatIsThrownIsOneLineAndTheRestStillComes) {
-    String const path = WritePicture("a.mki");
-    listener.whenNoted = [](std::string const& event) {
-        if (event == "pending") throw 7;
-        throw std::runtime_error(event);
-    };
-    Request(1, path);
-    Request(2, path, BITMAP_TYPE_GRAPHICS);
-    listener.AwaitCompleted(2);
-    AwaitIdle();
-    EXPECT_EQ(log.GetTexts(ANDROID_LOG_ERROR),
-              (Events{"OnCallbackPending threw something that is no std::exception",
-                      "OnLoad threw: load 1 5x4", "OnCallbackCompleted threw: completed",
-                      "OnCallbackPending threw something that is no std::exception",
-                      "OnLoad threw: load 2 5x4", "OnCallbackCompleted threw: completed"}));
-    listener.whenNoted = nullptr;
-    {
-        ThrowingCodecs const codecs;
-        Request(3, path);
-        Request(4, path, BITMAP_TYPE_GRAPHICS);
-        listener.AwaitCompleted(4);
-    }
-    EXPECT_EQ(listener.GetResults(), (Events{"load 1 5x4", "load 2 5x4", "error 3", "error 4"}));
-}
-
 TEST_F(Load, ACpuBitmapDiesOnItsQueueBehindTheCallbacks) {
     String const path = WritePicture("a.mki");
     HandPumpedQueue pumped;
@@ -256,27 +168,6 @@ TEST_F(Load, ACpuBitmapDiesOnItsQueueBehindTheCallbacks) {
     gate.Open();
     Loader().WaitUntilMsgQueueRequired();
     EXPECT_EQ(pumped.RunAll(), 1) << "a cancelled load's, too";
-}
-
-TEST_F(Load, ACpuBitmapThatNoQueueTakesBelongsToWhoeverGotIt) {
-    String const path = WritePicture("a.mki");
-    RefusingQueue refusing;
-    std::unique_ptr<Bitmap> kept;
-    listener.whenLoaded = [&](Bitmap* bitmap, IMKBitmap*) { kept.reset(bitmap); };
-    for (IGLMsgQueue* none : {static_cast<IGLMsgQueue*>(&refusing), static_cast<IGLMsgQueue*>(nullptr)}) {
-        Loader().RequestLoad(&listener, 1, path, BITMAP_TYPE_CPU, none, 0, 0);
-        MKBitmapLoader::WaitForAllSaveRequestsToEnd(nullptr);
-        MKBitmapLoader::WaitUntilMsgQueueRequired();
-        ASSERT_TRUE(kept);
-        EXPECT_EQ(kept->GetBuffer()[3], 255);
-        kept.reset();
-    }
-    CodecGate gate;
-    Loader().RequestLoad(&listener, 1, path, BITMAP_TYPE_CPU, &refusing, 0, 0);
-    gate.AwaitArrival();
-    Loader().CancelAllLoadRequest(&listener);
-    gate.Open();
-    Loader().WaitUntilMsgQueueRequired(); // nobody got this one: it went by itself, or the sanitizer tells
 }
 
 TEST_F(Load, WaitersForLoadsAreAllLetGo) {

@@ -1,11 +1,11 @@
 // The end of a process whose loader sleeps, works or waits. Each case ends a process of its own, which must
 // come to its end, with no crash and no leak that a sanitizer would report.
+#include "moka/base/Bitmap.h"
 #include "moka/graphics/bitmap/ImageDecoding.h"
-#include "moka/graphics/factory/MKGraphicsFactory.h"
+#include "moka/graphics/loader/BitmapLoader.h"
 #include "moka/graphics/loader/MKBitmapLoader.h"
-#include "moka/renderer/RendererFactory.h"
 #include "tests/support/LogCapture.h"
-#include "tests/support/Queues.h"
+#include "tests/support/TestFiles.h"
 #include "tests/unit/loader/CodecGate.h"
 
 #include <cstdlib>
@@ -14,6 +14,34 @@
 
 namespace Moka::Testing {
 namespace {
+
+// In a process that has nothing to decode the platform's foreign formats with. The others here are fresh ones.
+TEST(NoDecoder, CpuLoadsDoWithoutItAndGpuLoadsDoNot) {
+    LogCapture const log;
+    TempFolder const folder;
+    String const path(folder.Path("a.png"));
+    ASSERT_TRUE(SaveImage(MakeGradient(5, 4), folder.Path("a.png")));
+
+    std::unique_ptr<Bitmap> onCpu;
+    int errors = 0;
+    BitmapLoader::Callback cpu;
+    cpu.onLoad = [&](int, String const&, Bitmap& loaded) { onCpu.reset(&loaded); }; // no queue takes it
+    MKBitmapLoader::Callback gpu;
+    gpu.onLoadError = [&](int, String const&) { ++errors; };
+    {
+        BitmapLoader cpuLoader("cpu", &cpu);
+        MKBitmapLoader gpuLoader("gpu", &gpu);
+        BitmapLoader::startEventLoopBySelf();
+        cpuLoader.RequestLoad(1, path, nullptr);
+        gpuLoader.RequestLoad(2, path, nullptr);
+        BitmapLoader::WaitForAllSaveRequestsToEnd(nullptr);
+        BitmapLoader::WaitUntilMsgQueueRequired();
+    }
+    ASSERT_TRUE(onCpu);
+    EXPECT_EQ(onCpu->GetWidth(), 5);
+    EXPECT_EQ(errors, 1);
+    EXPECT_TRUE(log.Has("MKBitmapFactory : gDecodeFile Not loaded"));
+}
 
 class ProcessExit : public testing::Test {
 protected:
@@ -71,20 +99,6 @@ TEST_F(ProcessExit, InTheMiddleOfAFileWithMoreQueued) {
         gate.AwaitArrival();
         loader.RequestSave(2, "s.unknown", new unsigned char[400](), 10, 10, nullptr, 100);
         for (int id = 0; id < 10; ++id) loader.RequestLoad(id, "missing.mki", nullptr);
-    });
-}
-
-TEST_F(ProcessExit, WithAReadBackThatTheQueueRefused) {
-    ExpectCleanExit([] {
-        static bool refuse = false;
-        static RefusingQueue queue(RefusingQueue::Predicate([](int, ITask*) { return refuse; }));
-        RendererFactory::AttachContext();
-        MKBitmapLoader::startEventLoopBySelf();
-        static IMKBitmap* const bitmap =
-            MKGraphicsFactory::CreateBitmap(&queue, 4, 4, nullptr, false, 1, false);
-        refuse = true;
-        MKBitmapLoader loader("pad", nullptr);
-        EXPECT_TRUE(loader.RequestSave(1, "s.png", *bitmap, nullptr, 100));
     });
 }
 

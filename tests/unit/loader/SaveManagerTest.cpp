@@ -103,31 +103,6 @@ TEST_F(SaveManager, WaitingHandsResultsOverOnTheWaitingThread) {
     EXPECT_EQ(results.size(), 2u);
 }
 
-TEST_F(SaveManager, WithoutSavesWaitingTouchesNothing) {
-    MKBitmapSaveManager manager;
-    HandPumpedQueue pumped;
-    manager.WaitForSaveCompleting(&pumped);
-    manager.WaitForSaveCompleting(nullptr);
-    EXPECT_EQ(pumped.GetWaitCount(), 0);
-    EXPECT_EQ(LinesOf("mok_log"), (Events{"SaveManager::WaitForSaveCompleting mSaveCount(0) End",
-                                          "SaveManager::WaitForSaveCompleting mSaveCount(0) End"}));
-}
-
-TEST_F(SaveManager, SeveralThreadsMayWaitWhileTheMessageLoopRuns) {
-    MKBitmapSaveManager manager;
-    Callback callback = MakeCallback();
-    for (int round = 0; round < 5; ++round) {
-        results.clear();
-        for (int i = 0; i < 6; ++i) Request(manager, std::to_string(i) + ".mki", &callback);
-        std::vector<std::thread> waiters;
-        for (int i = 0; i < 3; ++i) waiters.emplace_back([&] { manager.WaitForSaveCompleting(queue.get()); });
-        while (manager.GetRequestSaveCount() > 0) messages.RunPending();
-        for (std::thread& waiter : waiters) waiter.join();
-        EXPECT_EQ(results, (Events{"saved 0.mki", "saved 1.mki", "saved 2.mki", "saved 3.mki", "saved 4.mki",
-                                   "saved 5.mki"}));
-    }
-}
-
 TEST_F(SaveManager, ACallbackMayRequestAnotherSaveAndThrow) {
     MKBitmapSaveManager manager;
     Callback callback = MakeCallback();
@@ -143,16 +118,6 @@ TEST_F(SaveManager, ACallbackMayRequestAnotherSaveAndThrow) {
     manager.WaitForSaveCompleting(queue.get());
     EXPECT_EQ(results, (Events{"saved a.png", "saved b.png", "saved again1.png", "saved again0.png"}));
     EXPECT_EQ(log.Count(ANDROID_LOG_ERROR, "threw: no"), 4);
-}
-
-TEST_F(SaveManager, ARefusedRequestStaysCounted) {
-    MKBitmapSaveManager manager;
-    Callback callback = MakeCallback();
-    auto const empty = RefPtr<IMKBitmap>::Adopt(
-        MKGraphicsFactory::CreateBitmap(queue.get(), reinterpret_cast<TextureObject const*>(this), 1));
-    EXPECT_FALSE(manager.RequestSave(1, Path("a.png"), *empty, &callback, 100));
-    EXPECT_EQ(manager.GetRequestSaveCount(), 1);
-    EXPECT_EQ(results, Events{});
 }
 
 TEST_F(SaveManager, DestroyedWithSavesAndResultsItLeavesTheFilesAndCallsNobody) {
@@ -174,17 +139,6 @@ TEST_F(SaveManager, DestroyedWithSavesAndResultsItLeavesTheFilesAndCallsNobody) 
     EXPECT_TRUE(log.Has("SaveManager save remain 3"));
     for (char const* name : {"result.png", "encoding.png", "queued.png"}) EXPECT_TRUE(Exists(name));
     EXPECT_EQ(results, Events{});
-}
-
-TEST_F(SaveManager, WithoutAMessageLoopResultsComeToThoseWhoWait) {
-    std::thread([this] {
-        MKBitmapSaveManager manager;
-        Callback callback = MakeCallback();
-        Request(manager, "a.png", &callback);
-        manager.WaitForSaveCompleting(nullptr);
-        EXPECT_EQ(results, Events{"saved a.png"});
-    }).join();
-    EXPECT_EQ(log.Count(ANDROID_LOG_ERROR), 0);
 }
 
 } // namespace

@@ -83,6 +83,7 @@ TEST(ArithmeticDigest, Matrix3) {
         auto m = numbers.NextMatrix<Matrix3f>();
         float const a = numbers.Next(), b = numbers.Next(), c = numbers.Next(), d = numbers.Next();
         digest.AddMatrix(m.inverse());
+        digest.AddMatrix(m.transpose());
         m.preConcat(numbers.NextMatrix<Matrix3f>());
         m.postScale(a, b, c, d);
         m.preTranslate(c, d);
@@ -100,7 +101,7 @@ TEST(ArithmeticDigest, Matrix3) {
         m.mapRect(&rounded, Rect(1, 2, 300, 400));
         digest.Add(rounded);
     }
-    EXPECT_EQ(digest.Get(), 0x08d6486e02c10a4au);
+    EXPECT_EQ(digest.Get(), 0x8a900a57d492a392u);
 }
 
 TEST(ArithmeticDigest, Matrix4) {
@@ -114,13 +115,16 @@ TEST(ArithmeticDigest, Matrix4) {
         digest.AddMatrix(m.inverse());
         auto const product = m * right * Matrix4f::translateMatrix(a, b, c) * Matrix4f::scaleMatrix(c, b, a);
         digest.AddMatrix(product);
+        digest.AddMatrix(product.transpose());
+        digest.AddMatrix(product.rotation());
+        digest.AddMatrix(product.translation());
         double terms[16];
         product.calculaeMatrix(terms);
         for (double term : terms) digest.Add(term);
         digest.AddMatrix(Matrix4f::orthoMatrix(a, b, c, d, -1, 1) * FromMatrix3(plane));
         digest.AddMatrix(Matrix4f::rotateMatrix(Vector3<float>{a, b, c}, Vector3<float>{c, a, b}));
     }
-    EXPECT_EQ(digest.Get(), 0xe8b390226834abcbu);
+    EXPECT_EQ(digest.Get(), 0xae6ae3643eb169cdu);
 }
 
 TEST(ArithmeticDigest, Rectangles) {
@@ -153,10 +157,15 @@ TEST(ArithmeticDigest, Angles) {
         m.preRotate(b, c, a);
         m.postRotate(c, a, b);
         digest.AddMatrix(m);
-        digest.AddMatrix(Matrix4f::rotateMatrix(a, b, c));
+        m.setRotate(b, c, a);
+        digest.AddMatrix(m);
+        auto space = Matrix4f::rotateMatrix(a, b, c);
+        digest.AddMatrix(space.rotate(c, b, a));
+        space.rotateSelf(b, c, a);
+        digest.AddMatrix(space);
         digest.AddMatrix(Matrix4f::rotateMatrix(a, Vector3<float>{b, c, a}));
     }
-    EXPECT_EQ(digest.Get(), 0x4b84909eaea40370u);
+    EXPECT_EQ(digest.Get(), 0x1dcd91930b41b9c2u);
 }
 
 } // namespace

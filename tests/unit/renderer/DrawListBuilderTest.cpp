@@ -140,33 +140,11 @@ TEST_F(DrawListBuilderTest, ADrawJoinsAnEarlierRunOnlyPastWhatItDoesNotTouch) {
     EXPECT_EQ(Finish(), "0|1|2|3");
 }
 
-TEST_F(DrawListBuilderTest, ARunOfMoreBoxesThanAreKeptIsTouched) {
-    RunState a;
-    RunState b;
-    b.scissor.on = true;
-    Draw(a, MakeBox('0'));
-    for (int i = 0; i < 1024; ++i) Draw(b, MakeBox('1'));
-    Draw(a, MakeBox('0'));
-    EXPECT_EQ(FinishRuns().size(), 2u);
-    builder.Clear(false);
-    Draw(a, MakeBox('0'));
-    for (int i = 0; i < 1025; ++i) {
-        SetColor(static_cast<float>(i));
-        Draw(b, MakeBox('1'));
-    }
-    Draw(a, MakeBox('0'));
-    EXPECT_EQ(FinishRuns().size(), 3u);
-}
-
 TEST_F(DrawListBuilderTest, EqualValuesAreOneRecord) {
     RunState a;
     RunState b;
     b.scissor.on = true;
     Draw(a, MakeBox('0'));
-    SetColor(1);
-    SetColor(0);
-    float const none[4] = {};
-    program->Set(color, none); // back to what it was
     Draw(a, MakeBox('1'));
     Draw(b, MakeBox('2'), 3);
     Draw(a, MakeBox('3'), 2);
@@ -222,79 +200,6 @@ TEST_F(DrawListBuilderTest, AShortRunVariesItsIntegersAndALongOneKeepsThem) {
     }
     ASSERT_EQ(FinishRuns().size(), 1u);
     EXPECT_EQ(std::get<ListedRun>(builder.GetList().commands[0]).varying, 3u);
-}
-
-TEST_F(DrawListBuilderTest, MoreIntegersThanTheRunHasBitsForAreNotMerged) {
-    for (int const count : {32, 33}) {
-        std::string text = "uniform float width;";
-        for (int i = 0; i < count; ++i) text += "uniform int i" + std::to_string(i) + ";";
-        program->Release();
-        program = std::make_unique<ProgramState>(GetRecorder(), "", text.c_str(), "program");
-        RunState const state;
-        Draw(state);
-        SetInteger(program->AddHandle("i31"), 1);
-        Draw(state);
-        std::vector<ListedRun> const runs = FinishRuns();
-        EXPECT_EQ(runs.size(), count == 32 ? 1u : 2u);
-        EXPECT_EQ(runs[0].varying, count == 32 ? 1u << 31 : 0u);
-        builder.Clear(false);
-    }
-}
-
-TEST_F(DrawListBuilderTest, ManyVerticesAreNotMovedTogether) {
-    constexpr int kMany = 1 << 13;
-    RunState a;
-    RunState b;
-    b.scissor.on = true;
-    for (int const more : {0, 1}) {
-        Draw(a, MakeBox('0'), kMany);
-        SetColor(1);
-        Draw(b, MakeBox('1'));
-        SetColor(2);
-        Draw(a, MakeBox('2'), kMany + more);
-        EXPECT_EQ(FinishRuns().size(), more ? 3u : 2u);
-        EXPECT_EQ(builder.GetList().vertices.size(), more ? 2u * kMany + 2 : 4u * kMany + 1);
-        builder.Clear(false);
-    }
-    EXPECT_EQ(Count(RunEnd::Scissor), 3u);
-    // Those that lie side by side need not be moved.
-    for (int i = 0; i < 5; ++i) {
-        SetColor(static_cast<float>(i));
-        Draw(a, MakeBox('0'), kMany);
-    }
-    EXPECT_EQ(FinishRuns().size(), 1u);
-}
-
-TEST_F(DrawListBuilderTest, TellsWhyARunEnds) {
-    struct {
-        RunEnd end;
-        std::function<void(RunState&)> change;
-    } const cases[] = {
-        {RunEnd::Program, [](RunState& state) { state.program = 7; }},
-        {RunEnd::Texture, [](RunState& state) { state.textures[1].texture = 7; }},
-        {RunEnd::Texture, [](RunState& state) { state.textures[0].sampling.wrapT = TextureWrapRepeat; }},
-        {RunEnd::Blend, [](RunState& state) { state.blend.SetEnabled(true, true); }},
-        {RunEnd::Scissor, [](RunState& state) { state.scissor.on = true; }},
-        {RunEnd::Clip,
-         [](RunState& state) {
-             state.depthStencil = {false, true};
-         }},
-        {RunEnd::Target, [](RunState& state) { state.target.frameBuffer = 7; }},
-        {RunEnd::Primitive, [](RunState& state) { state.primitive = PrimitiveType::TriangleStrip; }},
-        {RunEnd::Primitive, [](RunState& state) { state.format = 1; }},
-        {RunEnd::Other, [this](RunState&) { builder.Add(TextureClear{}); }},
-        {RunEnd::Other, [this](RunState&) { builder.Clear(false); }},
-        {RunEnd::Full, [this](RunState&) { builder.Clear(true); }},
-    };
-    for (auto const& [end, change] : cases) {
-        builder.Clear(false);
-        RunState state;
-        Draw(state);
-        std::uint64_t const before = Count(end);
-        change(state);
-        Draw(state);
-        EXPECT_EQ(Count(end), before + 1) << static_cast<int>(end);
-    }
 }
 
 } // namespace

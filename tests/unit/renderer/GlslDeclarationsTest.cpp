@@ -45,13 +45,5 @@ attribute vec2 last; /* never closed; attribute vec2 swallowed;)";
     EXPECT_THAT(Find(source, {"uniform"}), ElementsAre("uniform float after"));
 }
 
-TEST(GlslDeclarationsTest, TextThatIsNoGlslDeclaresNothing) {
-    for (char const* text :
-         {"", "attribute", "attribute;", "attribute vec4;", "uniform vec4 x", "}}}; ]", "/*", "#"}) {
-        EXPECT_THAT(Find(text, {"uniform", "attribute"}), IsEmpty()) << text;
-    }
-    EXPECT_THAT(Find(nullptr, {"uniform"}), IsEmpty());
-}
-
 } // namespace
 } // namespace Moka::Testing

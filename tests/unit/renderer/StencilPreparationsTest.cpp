@@ -187,33 +187,6 @@ TEST_F(StencilPreparationsTest, OneIsDrawnAgainOnlyWhenTheBufferMayHoldSomething
     }
 }
 
-TEST_F(StencilPreparationsTest, ThePartThatIsDrawnEnclosesTheDrawsThatNeedIt) {
-    using detail::ScissorState;
-    struct {
-        std::vector<DrawBounds> draws;
-        ScissorRect part; // pixels, one more on either side
-    } const cases[] = {
-        {{{0, 0, 0.1f, 0.1f}}, {49, 49, 7, 7}},
-        {{{0, 0, 0.1f, 0.1f}, {-0.5f, 0.5f, -0.4f, 0.6f}}, {24, 49, 32, 32}},
-        {{{0.98f, -3, 3, -0.98f}}, {98, 0, 2, 2}},
-        {{{0, 0, 0.1f, 0.1f}, {}}, {0, 0, kSize, kSize}},
-    };
-    detail::DrawListBuilder const& list = detail::GetAttachedRecorder()->list;
-    for (auto const& [draws, part] : cases) {
-        Do('e');
-        Prepare(1, 1);
-        for (DrawBounds const& bounds : draws) Draw(bounds);
-        ASSERT_GE(list.GetList().commands.size(), 3u);
-        auto const& clear = std::get<detail::DepthStencilClear>(list.GetList().commands[0]);
-        auto const& mask = list.GetList().states[std::get<detail::Run>(list.GetList().commands[1]).state];
-        ScissorState const expected{true, part};
-        EXPECT_TRUE(clear.scissor == expected)
-            << part.x << " " << clear.scissor.rect.x << " " << clear.scissor.rect.width;
-        EXPECT_TRUE(mask.scissor == expected) << part.x;
-        RendererFactory::Flush();
-    }
-}
-
 TEST_F(StencilPreparationsTest, ADrawAfterOneThatIsDrawnAnewKeepsItsOwnState) {
     Do('p');
     Do('d');

@@ -234,17 +234,6 @@ TEST(SceneFormat, GroupsArePlacedClippedRepeatedAndLeaveNothingBehind) {
         });
 }
 
-TEST(SceneFormat, SizeAndBackgroundAreTheScenes) {
-    Scene const scene = ParseScene(
-        R"({"about": "A & B.", "size": [65535, 1], "background": [0.5, 0.25, 0, 0.5], "operations": []})",
-        "x", "");
-    EXPECT_EQ(scene.about, "A & B.");
-    EXPECT_EQ(scene.width, 65535);
-    EXPECT_EQ(scene.height, 1);
-    EXPECT_EQ(scene.background.x, 0.5f);
-    EXPECT_EQ(scene.background.w, 0.5f);
-}
-
 struct Mistake {
     std::string text;
     char const* start; // of the message, behind the file's name
@@ -261,23 +250,17 @@ TEST(SceneFormat, AMistakeInTheFileIsNamedWithItsPlace) {
     ExpectNamed({
         {"", "1:1: this is no JSON: syntax error"},
         {"{\n\"size\": [8, 6],\n}", "3:1: this is no JSON: syntax error"},
-        {"{\"a\n\": 1}", "1:4: this is no JSON: syntax error"},
-        {"{\"size\": [8, 6], \"about\": \"\xFF\"}", "1:28: this is no JSON: syntax error"},
         {"{\n\"size\": [8, 1e999]}", "2:13: this is no JSON: number overflow"},
         {"{\n\n\"size\": [8, 1e39]}", "3:13: a number is too large"},
         {"{\"size\": [8, 6],\n  \"size\": [8, 6]}", "2:3: \"size\" is given twice"},
-        {"{\n}", "1:1: the scene needs \"size\""},
         {"{\"size\": 8}", "1:10: size must be [width, height], not 8"},
         {"{\"size\": [8,\n0]}", "2:1: size[1] must be a whole number from 1 to 65535, not 0"},
-        {"{\"size\": [65536, 1]}", "1:11: size[0] must be a whole number from 1 to 65535, not 65536"},
         {"{\"size\": [16384, 16385]}", "1:10: size: more than 1 GiB of pixels"},
-        {"{\"size\": [8, 6], \"operations\": {}}", "1:32: operations must be a list of operations"},
         {"{\"size\": [8, 6], \"operations\": [],\n\"backgroud\": 1}",
          "2:14: backgroud is unknown; there are size, about, background, labels, bitmaps, paints, "
          "operations"},
         // A column counts characters, and what is in a text is no structure.
         {"{\"about\": \"\u00e9\\\\\\\"{[,\", \"size\": true}", "1:31: size must be"},
-        {"{\"size\": [8, 6],\n\"background\": \"#12345\"}", "2:15: background must be \"#RRGGBB\""},
         {"{\"size\": [8, 6],\n\"bitmaps\": {\n\"a\": {\"picture\": \"cat\", \"width\": 1, \"height\": 1}}}",
          "3:18: bitmaps.a.picture must be one of gradient, checker"},
         {"{\"size\": [8, 6],\n\"bitmaps\": {\"a b\": {\"picture\": \"photo\",\n\"width\": 1,\n\"height\": "
@@ -299,30 +282,18 @@ TEST(SceneFormat, AMistakeInAnOperationIsNamedWithItsPlace) {
          "6:11: operations[1].DrawCircle.raduis is unknown; there are cx, cy, radius, paint"},
         {"{\"Save\": {}},\n\n{\"DrawCircel\": {}}",
          "6:16: operations[1].DrawCircel is no operation; there are Group, DrawBitmap"},
-        {R"({"Save": {}, "Restore": {}})", "4:1: operations[0] must be an object with one name"},
-        {R"({"Save": 3})", "4:10: operations[0].Save must be an object"},
         {R"({"Save": {"flag": "SaveSome"}})",
          "4:19: operations[0].Save.flag must be one of SaveAll, SaveMatrix, SaveClip or its number"},
-        {R"({"DrawRect": {"rect": [1, 2, 3]}})",
-         "4:23: operations[0].DrawRect.rect must be [left, top, right, bottom], not a list of 3"},
         {"{\"DrawRect\": {\"rect\": [1, 2,\n3, null]}}",
          "5:4: operations[0].DrawRect.rect[3] must be a number, not null"},
-        {"{\"DrawRect\": {\"rect\": [1, 2, 3, 4],\n\"paint\": \"ink\"}}",
-         "5:10: operations[0].DrawRect.paint must be described under \"paints\""},
         {"{\"DrawRect\": {\"rect\": [1, 2, 3, 4],\n\"paint\": {\"xfermode\": \"Multiply\"}}}",
          "5:23: operations[0].DrawRect.paint.xfermode must be one of Add, Clear"},
-        {"{\"DrawRect\": {\"rect\": [1, 2, 3, 4],\n\"paint\": {\"antiAliasing\": 1}}}",
-         "5:27: operations[0].DrawRect.paint.antiAliasing must be true or false, not 1"},
         {R"({"DrawBitmap": {"bitmap": "a", "x": 1, "y": 2}})",
          "4:27: operations[0].DrawBitmap.bitmap must be described under \"bitmaps\""},
         {R"({"DrawSimpleLines": {"points": [[1, 2]]}})",
          "4:32: operations[0].DrawSimpleLines.points must be an even number of points"},
         {R"({"SetClipRect": {"x": 0.5, "y": 1, "width": 2, "height": 3}})",
          "4:23: operations[0].SetClipRect.x must be a whole number, not 0.5"},
-        {R"({"SetMatrix": {"matrix": [1, 0, 0, 1, 0, 0]}})",
-         "4:26: operations[0].SetMatrix.matrix must be nine numbers, column by column"},
-        {R"({"Group": {"clip": [0, 0, 1.5, 1], "operations": []}})",
-         "4:27: operations[0].Group.clip[2] must be a whole number"},
         {R"({"Group": {"repeat": {"count": 0}, "operations": []}})",
          "4:32: operations[0].Group.repeat.count must be a whole number from 1 to 100000, not 0"},
         {"{\"Group\": {\"operations\": [\n{\"Group\": {\"operations\": [\n{\"Draw\": {}}]}}]}}",
@@ -366,18 +337,6 @@ TEST(SceneFormat, BitmapsAreCountedBeforeTheirPixelsAreMade) {
     TempFolder const folder;
     ASSERT_TRUE(SaveImage(MakeGradient(2, 2), folder.Path("a.png")));
     EXPECT_EQ(FindError(with(4, "{\"file\": \"" + folder.Path("a.png") + "\"}")), expected);
-}
-
-TEST(SceneFormat, ABitmapThatCannotBeMadeDrawsNothing) {
-    Scene const scene = ParseScene(R"({"size": [8, 6],
-        "bitmaps": {"a": {"picture": "photo", "width": 5, "height": 4}},
-        "operations": [{"DrawBitmap": {"bitmap": "a", "x": 1, "y": 2}}]})",
-                                   "test", "");
-    Picture const painted = Paint(8, 6, [&](IMKCanvas& canvas, Scenes::SceneStage&) {
-        EmptyStage noRoom;
-        EXPECT_THROW(DrawScene(scene, canvas, noRoom), SceneError);
-    });
-    EXPECT_TRUE(painted == Picture(8, 6));
 }
 
 } // namespace

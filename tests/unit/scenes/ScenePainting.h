@@ -17,11 +17,4 @@ inline Picture Paint(int width, int height,
     return bitmap->image;
 }
 
-// A stage with no room for bitmaps, and no GPU.
-class EmptyStage final : public Scenes::SceneStage {
-public:
-    IMKBitmap* MakeBitmap(Picture const&) override { return nullptr; }
-    IGLMsgQueue* GetQueue() override { return nullptr; }
-};
-
 } // namespace Moka::Testing

@@ -24,13 +24,6 @@ final class Host {
     /** Everything that native code reads of a display, in the order of its constructor, then the rest. */
     static native double[] readDisplay(long handle);
 
-    /**
-     * Loads a file with the loader into a bitmap on the GPU, paints the pixels [20, 60) x [10, 50) in the
-     * colour 0xff2040c0, and saves it. The name of the Java thread that called back; what went wrong
-     * after an exclamation mark.
-     */
-    static native String loadDrawSave(String from, String to);
-
     private static native String[] takeLog();
 
     /** The texts that were logged since the last call. */

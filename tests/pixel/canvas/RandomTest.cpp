@@ -1,5 +1,6 @@
-// Draws that the renderer joins against the same draws one by one: random scenes of everything that a canvas
-// draws, in which neighbours differ in colour, size, matrix, integers, program, clip and blending.
+// Random scenes of everything that a canvas draws. Each shape in a cell of its own, under clips and matrices, against
+// the reference, on one strip and on several; and shapes on a pile that the renderer joins, against the same draws one
+// by one.
 #include "moka/renderer/RendererFactory.h"
 #include "tests/pixel/canvas/CanvasDrawing.h"
 
@@ -11,18 +12,50 @@ namespace {
 constexpr int kWidth = 160;
 constexpr int kHeight = 120;
 
+constexpr MKPaint::XFermode kModes[] = {MKPaint::SrcOver, MKPaint::SrcOver, MKPaint::SrcAtop,
+                                        MKPaint::Darken,  MKPaint::SrcOver, MKPaint::Src,
+                                        MKPaint::DstOut,  MKPaint::Lighten};
+
 class RandomScene {
 public:
-    explicit RandomScene(unsigned seed) : mRandom(seed) {}
+    RandomScene(unsigned seed, int top) : mRandom(seed), mTop(top) {}
 
-    void Draw(IMKCanvas& canvas, Scenes::SceneStage& stage) {
+    void DrawPile(IMKCanvas& canvas, Scenes::SceneStage& stage) {
         RefPtr<IMKBitmap> const bitmaps[] = {MakeBitmap(stage, MakeAlphaPattern(12, 9)),
                                              MakeBitmap(stage, MakeGradient(20, 20))};
         for (int i = 0; i < 150; ++i) {
             if (Below(12) == 0) ChangeClip(canvas);
             if (Below(4) == 0) ChangeMatrix(canvas);
             ChangePaint();
-            DrawShape(canvas, *bitmaps[Below(2)]);
+            DrawShape(canvas, *bitmaps[Below(2)], {Between(0, kWidth), Between(0, kHeight)}, 40);
+        }
+    }
+
+    void DrawCells(IMKCanvas& canvas, Scenes::SceneStage& stage) {
+        RefPtr<IMKBitmap> const bitmap = MakeBitmap(stage, MakeGradient(20, 20));
+        for (int i = 0; i < 12; ++i) {
+            int const x = i % 4 * 40;
+            int const y = mTop + i / 4 * 40;
+            int const level = canvas.Save(IMKCanvasBase::SaveAll);
+            int const clips = Below(4);
+            for (int clip = 0; clip < clips; ++clip) {
+                canvas.SetMatrix(Matrix3<float>());
+                if (Flip())
+                    canvas.PreRotate(Between(-10, 10), static_cast<float>(x) + 20,
+                                     static_cast<float>(y) + 20);
+                canvas.SetClipRect(x + Below(15), y + Below(15), 15 + Below(20), 15 + Below(20),
+                                   static_cast<IMKCanvasBase::ClipOp>(Below(7)));
+            }
+            canvas.SetMatrix(Matrix3<float>());
+            if (Flip()) canvas.PreTranslate(Between(-2, 2), Between(-2, 2));
+            if (Flip())
+                canvas.PreRotate(Between(-90, 90), static_cast<float>(x) + 20, static_cast<float>(y) + 20);
+            ChangePaint();
+            mPaint.SetXFermode(kModes[Below(8)]);
+            mPaint.SetTileMode(static_cast<MKPaint::TileMode>(Below(3)));
+            DrawShape(canvas, *bitmap,
+                      {static_cast<float>(x) + Between(3, 10), static_cast<float>(y) + Between(3, 10)}, 24);
+            canvas.Restore(level);
         }
     }
 
@@ -31,7 +64,7 @@ private:
     float Between(float low, float high) {
         float const value = std::uniform_real_distribution<float>(low, high)(mRandom);
         // Through pixel centres and corners as often as not.
-        return Below(2) == 0 ? value : std::floor(value * 2) / 2;
+        return Below(2) == 0 ? value : std::floor(value * 4) / 4;
     }
     bool Flip() { return Below(2) == 0; }
 
@@ -53,13 +86,11 @@ private:
     }
 
     void ChangePaint() {
-        static constexpr MKPaint::XFermode kModes[] = {MKPaint::SrcOver, MKPaint::SrcOver, MKPaint::SrcAtop,
-                                                       MKPaint::Darken};
         if (Below(10) == 0) mMode = kModes[Below(4)];
         mPaint = MKPaint();
         mPaint.SetXFermode(mMode);
         mPaint.SetColor(Between(0, 1), Between(0, 1), Between(0, 1), Flip() ? 1 : Between(0, 1));
-        if (Below(5) == 0) mPaint.SetTintColor(Between(0, 1), Between(0, 1), Between(0, 1), 1);
+        if (Below(5) == 0) mPaint.SetTintColor(Between(0, 1), Between(0, 1), Between(0, 1), Between(0, 1));
         mPaint.SetAntiAliasing(Flip());
         mPaint.SetStyle(static_cast<MKPaint::Style>(Below(3)));
         mPaint.SetLineWidth(Between(1, 6));
@@ -67,42 +98,58 @@ private:
         if (Flip()) mPaint.SetDashedLinePattern(Vector2<float>(Between(1, 8), Between(1, 8)));
     }
 
-    void DrawShape(IMKCanvas& canvas, IMKBitmap& bitmap) {
-        float const x = Between(0, kWidth);
-        float const y = Between(0, kHeight);
-        RectF const box(x, y, x + Between(2, 40), y + Between(2, 40));
+    void DrawShape(IMKCanvas& canvas, IMKBitmap& bitmap, PointF const& at, float largest) {
+        float const x = at.x;
+        float const y = at.y;
+        RectF const box(x, y, x + Between(2, largest), y + Between(2, largest));
         switch (Below(7)) {
         case 0:
             return canvas.DrawRect(box, &mPaint);
         case 1:
             return canvas.DrawRoundRect(box, Between(1, 10), Between(1, 10), &mPaint);
         case 2:
-            return canvas.DrawCircle(x, y, Between(1, 20), &mPaint);
+            return canvas.DrawCircle(x + largest / 2, y + largest / 2, Between(1, largest / 2), &mPaint);
         case 3:
             return canvas.DrawLine(box.left, box.top, box.right, box.bottom, &mPaint);
         case 4:
             return canvas.DrawSimpleLine(box.left, box.top, box.right, box.bottom, &mPaint);
         case 5:
-            return canvas.DrawSimpleLines({{x, y}, {x + 9, y + 4}, {y, x}, {x, y + 20}}, &mPaint);
+            return canvas.DrawSimpleLines({{x, y}, {x + 9, y + 4}, {x + largest, y}, {x, y + 20}, {1, 1}},
+                                          &mPaint);
         default:
             return canvas.DrawBitmap(&bitmap, box, &mPaint);
         }
     }
 
     std::mt19937 mRandom;
+    int const mTop; // of the cells
     MKPaint mPaint;
     int mLevel = -1; // below the clip
     MKPaint::XFermode mMode = MKPaint::SrcOver;
 };
 
-class MergedTest : public CanvasDrawing, public ::testing::WithParamInterface<unsigned> {};
+class RandomTest : public CanvasDrawing, public ::testing::WithParamInterface<unsigned> {};
 
-TEST_P(MergedTest, RandomDrawsAreTheSameAsOneByOne) {
+TEST_P(RandomTest, ShapesInCellsLookAsTheReferenceDrawsThem) {
+    kept = 1; // some are darker than what they are drawn over
+    for (int const side : {kLarge, kWidth}) {
+        UseLargestSide(side);
+        int const top =
+            side == kLarge ? 0 : kWidth - kHeight / 2; // the first strip ends in the middle of the shapes
+        ExpectLikeReference({MakeBackdrop(kWidth, top + kHeight),
+                             [&](IMKCanvas& canvas, Scenes::SceneStage& stage) {
+                                 RandomScene(GetParam(), top).DrawCells(canvas, stage);
+                             }},
+                            "seed " + std::to_string(GetParam()) + " side " + std::to_string(side));
+    }
+}
+
+TEST_P(RandomTest, JoinedDrawsAreTheSameAsOneByOne) {
     kept = 1; // some are darker than what they are drawn over
     int variants = 0;
     Drawing const drawing =
         Twice({MakeBackdrop(kWidth, kHeight), [&](IMKCanvas& canvas, Scenes::SceneStage& stage) {
-                   RandomScene(GetParam()).Draw(canvas, stage);
+                   RandomScene(GetParam(), 0).DrawPile(canvas, stage);
                    unsigned char texel[4];
                    canvas.GetBitmap()->GetBitmapData(Rect(0, 0, 1, 1), texel); // flushes
                    variants = RendererFactory::GetStatistics().variants;
@@ -117,7 +164,7 @@ TEST_P(MergedTest, RandomDrawsAreTheSameAsOneByOne) {
     ExpectSame(single, merged, "merged", &slack);
 }
 
-INSTANTIATE_TEST_SUITE_P(Seeds, MergedTest, ::testing::Range(1u, 13u));
+INSTANTIATE_TEST_SUITE_P(Seeds, RandomTest, ::testing::Range(1u, 13u));
 
 } // namespace
 } // namespace Moka::Testing

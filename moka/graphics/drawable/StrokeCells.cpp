@@ -1,0 +1,344 @@
+#include "moka/graphics/drawable/StrokeCells.h"
+
+#include <algorithm>
+#include <limits>
+
+namespace Moka::detail {
+namespace {
+
+// Sides of the leaves that a segment asks for, the greatest of them: in device pixels, of its radius, and of its
+// length.
+constexpr double kLeafPixels = 8;
+constexpr double kLeafOfRadius = 0.25;
+constexpr double kLeafOfLength = 1.0 / 64;
+// A leaf with more segments is split, down to this side in device pixels; then the nearest ones are kept.
+constexpr int kManyEntries = 24;
+constexpr double kLeastLeafPixels = 0.25;
+constexpr int kMostEntries = 64;
+constexpr std::size_t kKeptEntries = 32;
+// Of a cell, in device pixels.
+constexpr double kLeastCellPixels = 0.25;
+// A thinner segment counts as good as one that fades as little as this more.
+constexpr double kAsWide = 0.95;
+
+constexpr std::size_t kCellSegments = StrokeCell::kPoints - 1;
+
+std::size_t At(int index) { return static_cast<std::size_t>(index); }
+
+double GetReach(StrokeSegment const& segment, StrokeScale const& scale) {
+    return std::max(segment.GetGreatestRadius() + scale.coarse * 0.5, scale.coarse);
+}
+
+} // namespace
+
+void StrokeCells::Add(StrokeSegment const& segment, bool mayBeTakenBack) {
+    mSegments.push_back(segment);
+    mMayTakeBack = mayBeTakenBack;
+    GrowRoot(segment);
+    double const target = std::max({kLeafPixels * mScale.coarse, kLeafOfRadius * segment.GetGreatestRadius(),
+                                    kLeafOfLength * segment.GetLength()});
+    Insert(0, mRoot, static_cast<int>(mSegments.size()) - 1, target);
+}
+
+void StrokeCells::TakeBackLast() {
+    Remove(0, mRoot, static_cast<int>(mSegments.size()) - 1);
+    mSegments.pop_back();
+    mMayTakeBack = false;
+}
+
+std::vector<StrokeCell> const& StrokeCells::Make() {
+    if (!mNodes.empty()) MakeNode(0, mRoot);
+    return mCells;
+}
+
+StrokeCells::Candidate StrokeCells::Judge(int segment, Square const& square) const {
+    StrokeSegment const& judged = mSegments[At(segment)];
+    double const half = square.side * 0.5;
+    auto const [distance, radius] = judged.Find(square.x + half, square.y + half);
+    double const reach = half * 1.41422;
+    double const edge = distance - radius;
+    return {segment, edge - reach, edge + reach, distance - reach, distance + reach};
+}
+
+bool StrokeCells::IsOutside(Candidate const& candidate) const {
+    double const half = mScale.coarse * 0.5;
+    bool const mayFade = mSegments[At(candidate.segment)].GetLeastRadius() < half;
+    return candidate.least >= (mayFade ? mScale.coarse : half);
+}
+
+bool StrokeCells::IsFull(Candidate const& candidate) const {
+    double const half = mScale.coarse * 0.5;
+    return candidate.most <= -half && mSegments[At(candidate.segment)].GetLeastRadius() >= half;
+}
+
+// Whether best covers each pixel of the square as much as the candidate.
+bool StrokeCells::IsBeaten(Candidate const& candidate, Candidate const& best) const {
+    if (!mScale.isEven || best.most > candidate.least) return false;
+    StrokeSegment const& winner = mSegments[At(best.segment)];
+    double const half = mScale.coarse * 0.5;
+    StrokeSegment const& loser = mSegments[At(candidate.segment)];
+    // Neither fades.
+    if (winner.GetLeastRadius() >= half && loser.GetLeastRadius() >= half) return true;
+    return best.mostDistance <= candidate.leastDistance &&
+           winner.GetLeastRadius() >= kAsWide * loser.GetGreatestRadius();
+}
+
+void StrokeCells::GrowRoot(StrokeSegment const& segment) {
+    double const reach = GetReach(segment, mScale);
+    double const left = std::min(segment.a.x, segment.b.x) - reach;
+    double const top = std::min(segment.a.y, segment.b.y) - reach;
+    double const right = std::max(segment.a.x, segment.b.x) + reach;
+    double const bottom = std::max(segment.a.y, segment.b.y) + reach;
+    if (mNodes.empty()) {
+        double const side = kLeafPixels * mScale.coarse;
+        mRoot = {std::floor(left / side) * side, std::floor(top / side) * side, side};
+        mNodes.emplace_back();
+    }
+    while (left < mRoot.x || top < mRoot.y || right > mRoot.x + mRoot.side || bottom > mRoot.y + mRoot.side) {
+        bool const toLeft = left < mRoot.x;
+        bool const toTop = top < mRoot.y;
+        int const children = static_cast<int>(mNodes.size());
+        mNodes.resize(mNodes.size() + 4);
+        mNodes[At(children + (toLeft ? 1 : 0) + (toTop ? 2 : 0))] = mNodes[0];
+        Node root;
+        root.children = children;
+        root.isChanged = mNodes[0].isChanged;
+        mNodes[0] = root;
+        mRoot = {mRoot.x - (toLeft ? mRoot.side : 0), mRoot.y - (toTop ? mRoot.side : 0), mRoot.side * 2};
+    }
+}
+
+void StrokeCells::Insert(int node, Square const& square, int segment, double target) {
+    if (mNodes[At(node)].isFull) return;
+    Candidate const candidate = Judge(segment, square);
+    if (IsOutside(candidate)) return;
+    mNodes[At(node)].isChanged = true;
+    bool const isLast = At(segment) + 1 == mSegments.size();
+    if (!(isLast && mMayTakeBack) && IsFull(candidate)) {
+        Fill(node, segment);
+        return;
+    }
+    bool const isLeaf = mNodes[At(node)].children == kNone;
+    if (isLeaf && square.side <= target) {
+        AddEntry(node, segment);
+        if (mNodes[At(node)].entryCount <= kManyEntries) return;
+        if (square.side > kLeastLeafPixels * mScale.coarse) {
+            Split(node, square, square.side * 0.5);
+        } else {
+            LimitEntries(node, square);
+        }
+        return;
+    }
+    if (isLeaf) Split(node, square, target);
+    int const children = mNodes[At(node)].children;
+    for (int i = 0; i < 4; ++i) Insert(children + i, square.GetQuarter(i), segment, target);
+}
+
+void StrokeCells::AddEntry(int node, int segment) {
+    mEntries.push_back({segment, mNodes[At(node)].entries});
+    mNodes[At(node)].entries = static_cast<int>(mEntries.size()) - 1;
+    ++mNodes[At(node)].entryCount;
+}
+
+void StrokeCells::Split(int node, Square const& square, double target) {
+    FreeCells(node);
+    std::vector<int> segments;
+    for (int i = mNodes[At(node)].entries; i != kNone; i = mEntries[At(i)].next) {
+        segments.push_back(mEntries[At(i)].segment);
+    }
+    int const children = static_cast<int>(mNodes.size());
+    mNodes.resize(mNodes.size() + 4);
+    mNodes[At(node)].children = children;
+    mNodes[At(node)].entries = kNone;
+    mNodes[At(node)].entryCount = 0;
+    // The first ones first, as they came.
+    for (auto segment = segments.rbegin(); segment != segments.rend(); ++segment) {
+        for (int i = 0; i < 4; ++i) Insert(children + i, square.GetQuarter(i), *segment, target);
+    }
+}
+
+void StrokeCells::Fill(int node, int segment) {
+    FreeCellsBelow(node);
+    Node filled;
+    filled.isChanged = true;
+    filled.isFull = true;
+    mNodes[At(node)] = filled;
+    AddEntry(node, segment);
+}
+
+void StrokeCells::Remove(int node, Square const& square, int segment) {
+    if (mNodes[At(node)].isFull || IsOutside(Judge(segment, square))) return;
+    mNodes[At(node)].isChanged = true;
+    int const children = mNodes[At(node)].children;
+    if (children != kNone) {
+        for (int i = 0; i < 4; ++i) Remove(children + i, square.GetQuarter(i), segment);
+        return;
+    }
+    int const first = mNodes[At(node)].entries;
+    if (first == kNone || mEntries[At(first)].segment != segment) return;
+    mNodes[At(node)].entries = mEntries[At(first)].next;
+    --mNodes[At(node)].entryCount;
+}
+
+void StrokeCells::FreeCells(int node) {
+    int& cells = mNodes[At(node)].cells;
+    while (cells != kNone) {
+        int const freed = cells;
+        cells = mNextCell[At(freed)];
+        mCells[At(freed)].side = 0;
+        mNextCell[At(freed)] = mFreeCell;
+        mFreeCell = freed;
+    }
+}
+
+void StrokeCells::FreeCellsBelow(int node) {
+    FreeCells(node);
+    int const children = mNodes[At(node)].children;
+    if (children == kNone) return;
+    for (int i = 0; i < 4; ++i) FreeCellsBelow(children + i);
+}
+
+void StrokeCells::LimitEntries(int node, Square const& square) {
+    if (mNodes[At(node)].entryCount < kMostEntries) return;
+    std::vector<Candidate> candidates;
+    for (int i = mNodes[At(node)].entries; i != kNone; i = mEntries[At(i)].next) {
+        candidates.push_back(Judge(mEntries[At(i)].segment, square));
+    }
+    auto const isNearer = [](Candidate const& a, Candidate const& b) { return a.most < b.most; };
+    std::sort(candidates.begin(), candidates.end(), isNearer);
+    candidates.resize(kKeptEntries);
+    auto const isEarlier = [](Candidate const& a, Candidate const& b) { return a.segment < b.segment; };
+    std::sort(candidates.begin(), candidates.end(), isEarlier);
+    int entry = mNodes[At(node)].entries;
+    for (auto kept = candidates.rbegin(); kept != candidates.rend(); ++kept) {
+        mEntries[At(entry)].segment = kept->segment;
+        if (kept + 1 == candidates.rend()) mEntries[At(entry)].next = kNone;
+        entry = mEntries[At(entry)].next;
+    }
+    mNodes[At(node)].entryCount = static_cast<int>(kKeptEntries);
+}
+
+void StrokeCells::MakeNode(int node, Square const& square) {
+    if (!mNodes[At(node)].isChanged) return;
+    mNodes[At(node)].isChanged = false;
+    int const children = mNodes[At(node)].children;
+    if (children != kNone) {
+        for (int i = 0; i < 4; ++i) MakeNode(children + i, square.GetQuarter(i));
+        return;
+    }
+    FreeCells(node);
+    mCandidates.clear();
+    for (int i = mNodes[At(node)].entries; i != kNone; i = mEntries[At(i)].next) {
+        mCandidates.push_back({mEntries[At(i)].segment, 0, 0, 0, 0});
+    }
+    std::reverse(mCandidates.begin(), mCandidates.end());
+    MakePart(node, square, 0);
+}
+
+namespace {
+
+// Of segments in the order of their numbers: neighbours share a point.
+template <class Candidates>
+int CountPoints(Candidates begin, Candidates end) {
+    int points = 0;
+    int last = -2;
+    for (auto candidate = begin; candidate != end; ++candidate) {
+        points += candidate->segment == last + 1 ? 1 : 2;
+        last = candidate->segment;
+    }
+    return points;
+}
+
+} // namespace
+
+// Of the candidates from begin on those that count in the square are put behind them.
+void StrokeCells::MakePart(int node, Square const& square, std::size_t begin) {
+    std::size_t const end = mCandidates.size();
+    std::size_t best = end;
+    for (std::size_t i = begin; i < end; ++i) {
+        Candidate const candidate = Judge(mCandidates[i].segment, square);
+        if (IsOutside(candidate)) continue;
+        if (IsFull(candidate)) {
+            mCandidates.resize(end);
+            mCandidates.push_back(candidate);
+            best = end;
+            break;
+        }
+        mCandidates.push_back(candidate);
+        if (candidate.most < mCandidates[best].most) best = mCandidates.size() - 1;
+    }
+    if (mCandidates.size() == end) return;
+    Candidate const winner = mCandidates[best];
+    auto const from = mCandidates.begin() + static_cast<std::ptrdiff_t>(end);
+    mCandidates.erase(std::remove_if(from, mCandidates.end(),
+                                     [&](Candidate const& candidate) {
+                                         return candidate.segment != winner.segment &&
+                                                IsBeaten(candidate, winner);
+                                     }),
+                      mCandidates.end());
+    bool const fits = CountPoints(from, mCandidates.end()) <= StrokeCell::kPoints;
+    if (fits || square.side <= kLeastCellPixels * mScale.fine) {
+        MakeCell(node, square, end);
+    } else {
+        for (int i = 0; i < 4; ++i) MakePart(node, square.GetQuarter(i), end);
+    }
+    mCandidates.resize(end);
+}
+
+// Of candidates that do not fit into one cell the farthest are left out: it is the smallest that there is.
+void StrokeCells::MakeCell(int node, Square const& square, std::size_t begin) {
+    auto const from = mCandidates.begin() + static_cast<std::ptrdiff_t>(begin);
+    auto const isEarlier = [](Candidate const& a, Candidate const& b) { return a.segment < b.segment; };
+    if (CountPoints(from, mCandidates.end()) > StrokeCell::kPoints) {
+        std::sort(from, mCandidates.end(),
+                  [](Candidate const& a, Candidate const& b) { return a.most < b.most; });
+        std::size_t count = std::min(mCandidates.size() - begin, kCellSegments);
+        std::array<Candidate, kCellSegments> nearest{};
+        do {
+            std::copy_n(from, count, nearest.begin());
+            std::sort(nearest.begin(), nearest.begin() + static_cast<std::ptrdiff_t>(count), isEarlier);
+        } while (CountPoints(nearest.begin(), nearest.begin() + static_cast<std::ptrdiff_t>(count)) >
+                     StrokeCell::kPoints &&
+                 --count > 0);
+        std::copy_n(nearest.begin(), count, from);
+        mCandidates.resize(begin + count);
+    }
+    StrokeCell& cell = mCells[At(TakeCell(node))];
+    cell = {};
+    cell.x = static_cast<float>(square.x);
+    cell.y = static_cast<float>(square.y);
+    cell.side = static_cast<float>(square.side);
+    int points = 0;
+    int joined = 0;
+    auto const put = [&](StrokeNode const& point) {
+        float* const at = cell.points + 3 * points++;
+        at[0] = static_cast<float>(point.x - square.x);
+        at[1] = static_cast<float>(point.y - square.y);
+        at[2] = static_cast<float>(point.radius);
+    };
+    int last = -2;
+    for (std::size_t i = begin; i < mCandidates.size(); ++i) {
+        int const segment = mCandidates[i].segment;
+        if (segment != last + 1) put(mSegments[At(segment)].a);
+        joined |= 1 << (points - 1);
+        put(mSegments[At(segment)].b);
+        last = segment;
+    }
+    cell.segments = static_cast<float>(joined);
+}
+
+int StrokeCells::TakeCell(int node) {
+    int taken = mFreeCell;
+    if (taken == kNone) {
+        mCells.emplace_back();
+        mNextCell.push_back(kNone);
+        taken = static_cast<int>(mCells.size()) - 1;
+    } else {
+        mFreeCell = mNextCell[At(taken)];
+    }
+    mNextCell[At(taken)] = mNodes[At(node)].cells;
+    mNodes[At(node)].cells = taken;
+    return taken;
+}
+
+} // namespace Moka::detail

@@ -1,0 +1,72 @@
+// StrokeSegment.h: the parts of a stroke as its cells see them.
+// Thread: any.
+// Units:  canvas pixels, in double precision.
+#pragma once
+
+#include <algorithm>
+#include <cmath>
+
+namespace Moka::detail {
+
+struct StrokeNode {
+    double x;
+    double y;
+    double radius;
+};
+
+// Canvas pixels that a device pixel is long: at most coarse and at least fine, both powers of two.
+struct StrokeScale {
+    double coarse = 1;
+    double fine = 1;
+    bool isEven = true; // the same in all directions
+
+    friend bool operator==(StrokeScale const& a, StrokeScale const& b) {
+        return a.coarse == b.coarse && a.fine == b.fine && a.isEven == b.isEven;
+    }
+};
+
+// All discs between two: with tangents to both, not with parallel sides.
+struct StrokeSegment {
+    StrokeNode a;
+    StrokeNode b;
+
+    struct Nearest {
+        double distance; // from the centre of a disc
+        double radius;   // of that disc
+    };
+
+    // The disc whose edge is nearest. As the shader finds it.
+    Nearest Find(double x, double y) const {
+        double const lineX = b.x - a.x;
+        double const lineY = b.y - a.y;
+        double const growth = b.radius - a.radius;
+        double const square = lineX * lineX + lineY * lineY;
+        double const rest = square - growth * growth;
+        double t = growth > 0 ? 1 : 0;
+        if (rest > 0) {
+            double const along = (x - a.x) * lineX + (y - a.y) * lineY;
+            double const across = std::fabs((x - a.x) * lineY - (y - a.y) * lineX);
+            t = std::clamp((along + across * growth / std::sqrt(rest)) / square, 0.0, 1.0);
+        }
+        return Measure(x, y, t);
+    }
+    // The disc whose centre is nearest.
+    Nearest FindCenter(double x, double y) const {
+        double const lineX = b.x - a.x;
+        double const lineY = b.y - a.y;
+        double const square = lineX * lineX + lineY * lineY;
+        double const along = (x - a.x) * lineX + (y - a.y) * lineY;
+        return Measure(x, y, square > 0 ? std::clamp(along / square, 0.0, 1.0) : 0.0);
+    }
+    double GetLength() const { return std::hypot(b.x - a.x, b.y - a.y); }
+    double GetGreatestRadius() const { return std::max(a.radius, b.radius); }
+    double GetLeastRadius() const { return std::min(a.radius, b.radius); }
+
+private:
+    Nearest Measure(double x, double y, double t) const {
+        return {std::hypot(x - a.x - (b.x - a.x) * t, y - a.y - (b.y - a.y) * t),
+                a.radius + (b.radius - a.radius) * t};
+    }
+};
+
+} // namespace Moka::detail

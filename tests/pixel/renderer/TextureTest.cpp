@@ -1,0 +1,208 @@
+// Textures: sampling state of each view, labels, what is refused, and the driver's transfer state. Uploads, copies and
+// lifetimes are in RandomWorkTest.
+#include "tests/pixel/renderer/DrawFixture.h"
+
+#include "moka/base/Rect.h"
+#include "moka/renderer/IRendererDeviceCaps.h"
+
+#include <GLES2/gl2ext.h>
+
+#include <limits>
+
+namespace Moka::Testing {
+namespace {
+
+class SamplingTest : public DrawFixture {
+protected:
+    // What a texture shows at a texture coordinate.
+    Color Sample(ITextureObject& bound, float s, float t) const {
+        Brush const sampler("precision highp float; uniform sampler2D texel; uniform vec2 place;\n"
+                            "void main() { gl_FragColor = texture2D(texel, place); }",
+                            "place");
+        std::array<float, 2> const place{s, t};
+        bound.Bind(0);
+        target->Activate();
+        sampler.program->MakeCurrent();
+        sampler.parameter->Set(place.data());
+        SetQuad(0, 0, 8, 8);
+        EXPECT_TRUE(quad->Draw(0, -1, 1));
+        Picture pixel(1, 1);
+        target->ReadPixels(3, 3, 1, 1, {pixel.pixels.data(), 1, 0, 0});
+        target->Deactivate(false, false);
+        return pixel.GetColor(0, 0);
+    }
+};
+INSTANTIATE_TEST_SUITE_P(ImmediateAndDeferred, SamplingTest, ::testing::Bool(), GetDrawMode);
+
+// Two columns and two rows, all different.
+Picture Corners() {
+    Picture const red = MakeImage(1, 1, kRed), green = MakeImage(1, 1, kGreen), blue = MakeImage(1, 1, kBlue);
+    return MakeImage(2, 2, kClear).With(0, 0, red).With(1, 0, green).With(0, 1, blue);
+}
+
+TEST_P(SamplingTest, StorageIsSharedAndSamplingStateIsNot) {
+    TexturePtr model = MakeTexture(2, 2);
+    TextureParameter const nearest[] = {{TextureParamFilteringMin, TextureFilterNearest},
+                                        {TextureParamFilteringMag, TextureFilterNearest},
+                                        {TextureParamWrappingS, TextureWrapRepeat},
+                                        {TextureParamWrappingT, TextureWrapMirroredRepeat}};
+    TexturePtr const view(
+        RendererFactory::CreateTextureObject(TextureDescriptor(model.get()), nearest, 4, {}));
+    view->Replace(Corners().pixels.data(), 0);
+    EXPECT_EQ(Sample(*model, -3.0f, 0.25f), kRed); // clamped
+    EXPECT_EQ(Sample(*model, 4.0f, 0.25f), kGreen);
+    EXPECT_EQ(Sample(*model, 0.25f, 0.75f), kBlue); // row 0 is at the top of texture space
+    Color const middle = Sample(*model, 0.5f, 0.25f);
+    EXPECT_NEAR(middle[0], 128, 1);
+    EXPECT_NEAR(middle[1], 128, 1);
+    EXPECT_EQ(Sample(*view, 0.49f, 0.25f), kRed);
+    EXPECT_EQ(Sample(*view, 1.25f, 0.25f), kRed);  // repeated across
+    EXPECT_EQ(Sample(*view, 0.25f, -0.25f), kRed); // mirrored above
+    EXPECT_EQ(Sample(*view, 0.25f, -0.75f), kBlue);
+    view->SetParameter(TextureParamWrappingS, TextureWrapClampToEdge);
+    EXPECT_EQ(Sample(*view, 1.25f, 0.25f), kGreen);
+
+    constexpr int kRefused[][2] = {{TextureParamWrappingS, 2},
+                                   {TextureParamWrappingT, 4},
+                                   {TextureParamWrappingS, -1},
+                                   {TextureParamFilteringMin, -1},
+                                   {TextureParamFilteringMag, 3},
+                                   {2, 0},
+                                   {-1, 0},
+                                   {TextureParamWrappingS, 1 << 30}};
+    for (auto const& [id, value] : kRefused) model->SetParameter(id, value);
+    EXPECT_EQ(TakeErrors().size(), std::size(kRefused));
+    EXPECT_EQ(Sample(*model, 2.25f, 0.25f), kGreen);
+    EXPECT_EQ(RendererFactory::GetStatistics().textures, 2); // with the target's
+    model.reset();
+    EXPECT_EQ(RendererFixture::Read(*view), Corners());
+}
+
+using TextureTest = RendererFixture;
+
+TEST_F(TextureTest, LabelsAreCopiedAtOnceAndReachTheDriver) {
+    TexturePtr const texture = MakeTexture(2, 2);
+    EXPECT_STREQ(texture->GetLabel(), "");
+    std::string label = "strip 3";
+    texture->SetLabel(label.c_str());
+    label.assign("changed");
+    EXPECT_STREQ(texture->GetLabel(), "strip 3");
+
+    auto const getLabel =
+        reinterpret_cast<PFNGLGETOBJECTLABELKHRPROC>(eglGetProcAddress("glGetObjectLabelKHR"));
+    texture->Bind(2);
+    glActiveTexture(GL_TEXTURE2);
+    char seen[64] = {};
+    getLabel(GL_TEXTURE, static_cast<GLuint>(GetInteger(GL_TEXTURE_BINDING_2D)), sizeof seen, nullptr, seen);
+    EXPECT_STREQ(seen, "strip 3");
+    texture->SetLabel(std::string(100000, 'x').c_str());
+    EXPECT_EQ(std::string(texture->GetLabel()).size(), 100000u);
+    texture->SetLabel(nullptr);
+    EXPECT_STREQ(texture->GetLabel(), "");
+}
+
+TEST_F(TextureTest, WhatTheDeviceCannotHoldOrDoesNotKnowIsRefusedWithOneLine) {
+    int const largest = RendererFactory::GetRendererDeviceCaps()->GetMaxTextureSize();
+    EXPECT_TRUE(MakeTexture(largest, 1));
+    constexpr int kHuge = 1 << 30;
+    for (auto const& [width, height] :
+         {std::pair{largest + 1, 4}, {4, largest + 1}, {0, 4}, {4, 0}, {-4, 4}, {kHuge, kHuge}}) {
+        EXPECT_FALSE(MakeTexture(width, height));
+        std::vector<std::string> const errors = TakeErrors();
+        ASSERT_EQ(errors.size(), 1u);
+        EXPECT_NE(errors[0].find(std::to_string(width) + " x " + std::to_string(height)), std::string::npos);
+        EXPECT_NE(errors[0].find(std::to_string(largest)), std::string::npos);
+    }
+    Picture const image = MakeImage(4, 4);
+    for (TextureDescriptor const& unknown :
+         {TextureDescriptor(4, 4, 1, 2, 6, 1, false, nullptr),
+          TextureDescriptor(4, 4, 0, 3, 6, 1, false, nullptr),
+          TextureDescriptor(4, 4, 0, 2, 7, 1, false, nullptr),
+          TextureDescriptor(4, 4, 0, 2, 6, 0, false, nullptr), TextureDescriptor(nullptr)})
+        EXPECT_FALSE(RendererFactory::CreateTextureObject(unknown, nullptr, 0, {}));
+    EXPECT_FALSE(RendererFactory::CreateTextureObject({4, 4, 0, 2, 6, 1, false, nullptr}, nullptr, 0,
+                                                      {image.pixels.data(), 0, 0, 3}));
+    EXPECT_FALSE(RendererFactory::CreateOffscreenRenderTarget(nullptr));
+    EXPECT_EQ(TakeErrors().size(), 7u);
+    TexturePtr const texture = MakeTexture(2, 2);
+    int const units = GetInteger(GL_MAX_COMBINED_TEXTURE_IMAGE_UNITS);
+    for (int const unit : {-1, units - 1, units}) texture->Bind(unit); // the last one is kept for uploads
+    EXPECT_EQ(TakeErrors().size(), 3u);
+}
+
+TEST_F(TextureTest, RowsThatWouldOverlapAndRectanglesThatAreNoneTransferNothing) {
+    auto const [texture, target] = MakeOffscreen(MakeImage(7, 5, kRed));
+    std::vector<Color> const pixels(35, kBlue);
+    constexpr int kMin = std::numeric_limits<int>::min();
+    constexpr int kMax = std::numeric_limits<int>::max();
+    texture->Replace(nullptr, 0);
+    for (Rect const& rect :
+         {Rect(kMax, kMax, kMin, kMin), Rect(kMin, kMin, kMin + 4, kMin + 4), Rect(kMax - 4, 0, kMax, 4)})
+        texture->Replace(rect, pixels.data(), 0);
+    EXPECT_EQ(TakeErrors().size(), 0u);
+    texture->Replace(pixels.data(), 7);
+    EXPECT_EQ(Read(*texture), MakeImage(7, 5, kRed));
+    Picture destination = MakeImage(7, 5);
+    target->ReadPixels(0, 0, 7, 5, {destination.pixels.data(), 6, 0, 0});
+    target->ReadPixels(0, 0, 1, 1, {destination.pixels.data(), 7, -1, 0});
+    target->ReadPixels(0, 0, 7, 5, {nullptr, 7, 0, 0}); // quietly
+    EXPECT_EQ(destination, MakeImage(7, 5));
+    std::vector<std::string> const errors = TakeErrors();
+    ASSERT_EQ(errors.size(), 3u);
+    EXPECT_NE(errors[0].find("28 bytes lie 7 bytes apart"), std::string::npos) << errors[0];
+}
+
+TEST_F(TextureTest, ABlockIsUploadedOutOfALargerImage) {
+    Picture const whole = MakePattern(300, 50);
+    TexturePtr const texture(RendererFactory::CreateTextureObject(
+        {183, 18, 0, 2, 6, 1, true, nullptr}, nullptr, 0, {whole.pixels.data(), 17, 32, whole.width}));
+    EXPECT_EQ(Read(*texture), MakeImage(183, 18).With(0, 0, whole.Crop(17, 32, 183, 18)));
+    EXPECT_EQ(RendererFactory::GetStatistics().bytesUploaded, 183u * 18 * 4);
+}
+
+TEST_F(TextureTest, ANewTextureIsTransparentWhateverTheHostsScissorAndMask) {
+    glEnable(GL_SCISSOR_TEST);
+    glScissor(2, 2, 1, 1);
+    glColorMask(GL_FALSE, GL_TRUE, GL_FALSE, GL_TRUE);
+    // Freed memory is what a driver hands out again, so it is filled with something to be seen.
+    { TexturePtr const old = MakeTexture(MakeImage(64, 64, kRed)); }
+    TexturePtr const texture = MakeTexture(64, 64);
+    EXPECT_EQ(Read(*texture), MakeImage(64, 64, kClear));
+    EXPECT_TRUE(glIsEnabled(GL_SCISSOR_TEST));
+    GLboolean mask[4];
+    glGetBooleanv(GL_COLOR_WRITEMASK, mask);
+    EXPECT_EQ(mask[0] + 2 * mask[1] + 4 * mask[2] + 8 * mask[3], 10);
+}
+
+TEST_F(TextureTest, TheHostsTransferStateDisturbsNothingAndIsBackAtItsDefaults) {
+    constexpr GLenum kNames[] = {GL_UNPACK_ROW_LENGTH, GL_UNPACK_SKIP_ROWS, GL_UNPACK_SKIP_PIXELS,
+                                 GL_PACK_ROW_LENGTH,   GL_PACK_SKIP_ROWS,   GL_PACK_SKIP_PIXELS};
+    GLuint buffer = 0;
+    glGenBuffers(1, &buffer);
+    glBindBuffer(GL_PIXEL_UNPACK_BUFFER, buffer);
+    glBufferData(GL_PIXEL_UNPACK_BUFFER, 4096, nullptr, GL_STREAM_DRAW);
+    auto const disturb = [&] {
+        for (GLenum const name : kNames) glPixelStorei(name, 3);
+        glPixelStorei(GL_UNPACK_ALIGNMENT, 1);
+        glPixelStorei(GL_PACK_ALIGNMENT, 8);
+        glBindBuffer(GL_PIXEL_UNPACK_BUFFER, buffer);
+        glBindBuffer(GL_PIXEL_PACK_BUFFER, buffer);
+    };
+    disturb();
+    Picture const image = MakePattern(9, 7);
+    TexturePtr const texture = MakeTexture(image);
+    disturb();
+    texture->Replace(Rect(1, 1, 4, 3), MakeImage(3, 2, kRed).pixels.data(), 0);
+    disturb();
+    Picture const all = Read(*texture);
+    EXPECT_EQ(all, image.With(1, 1, MakeImage(3, 2, kRed)));
+    // Only the direction that was used is put back.
+    texture->Replace(all.pixels.data(), 0);
+    for (GLenum const name : kNames) EXPECT_EQ(GetInteger(name), 0) << std::hex << name;
+    EXPECT_EQ(GetInteger(GL_PIXEL_UNPACK_BUFFER_BINDING) + GetInteger(GL_PIXEL_PACK_BUFFER_BINDING), 0);
+    EXPECT_EQ(GetInteger(GL_UNPACK_ALIGNMENT) + GetInteger(GL_PACK_ALIGNMENT), 8);
+    glDeleteBuffers(1, &buffer);
+}
+
+} // namespace
+} // namespace Moka::Testing
