@@ -283,8 +283,8 @@ TEST_F(StrokeTest, StripsAndClipsCutWithoutATrace) {
         for (int x = 0; x < kWidth; ++x) {
             bool const inside = x >= 20 && x < 90 && y >= 15 && y < 75;
             ASSERT_EQ(cut.GetColor(x, y), (inside ? plain : start).GetColor(x, y)) << x << ", " << y;
-            bool const isOne =
-                turned.GetColor(x, y) == plain.GetColor(x, y) || turned.GetColor(x, y) == start.GetColor(x, y);
+            bool const isOne = turned.GetColor(x, y) == plain.GetColor(x, y) ||
+                               turned.GetColor(x, y) == start.GetColor(x, y);
             ASSERT_TRUE(isOne) << x << ", " << y;
             drawn += turned.GetColor(x, y) == start.GetColor(x, y) ? 0 : 1;
         }
