@@ -24,9 +24,9 @@ namespace Moka::Notebook {
 
 class TileCache {
 public:
-    static constexpr int kSide = 512;
+    static constexpr int kSide = 256;
     static constexpr std::size_t kTileBytes = std::size_t{4} * kSide * kSide;
-    static constexpr std::size_t kObjectsAFrame = 4000;
+    static constexpr std::size_t kObjectsAFrame = 200;
 
     // Draws the page's area on a canvas in its units and returns the number of objects.
     using Paint = std::function<std::size_t(IMKCanvas&, RectF const&)>;
