@@ -3,6 +3,7 @@
 #include "moka/base/BitmapFactory.h"
 #include "moka/base/String.h"
 #include "moka/graphics/bitmap/IMKBitmapReadable.h"
+#include "scenes/SceneFile.h"
 
 namespace Moka::Notebook {
 
@@ -25,11 +26,11 @@ bool Images::Measure(std::string const& file, int& width, int& height, std::stri
     std::int64_t sum = std::int64_t{width} * height;
     for (auto const& [other, pixels] : mPixels)
         if (other != file) sum += pixels;
-    if (sum > kMaxPixels)
-        reason = "the page's images would have more than " + std::to_string(kMaxPixels) +
+    if (sum > Scenes::kMaxPicturePixels)
+        reason = "the page's images would have more than " + std::to_string(Scenes::kMaxPicturePixels) +
                  " pixels together; make it smaller";
-    else if (mPixels.size() >= kMaxFiles && mPixels.count(file) == 0)
-        reason = "a page has at most " + std::to_string(kMaxFiles) + " different images";
+    else if (mPixels.size() >= Scenes::kMaxBitmaps && mPixels.count(file) == 0)
+        reason = "a page has at most " + std::to_string(Scenes::kMaxBitmaps) + " different images";
     if (!reason.empty()) return false;
     mPixels[file] = std::int64_t{width} * height;
     return true;

@@ -1,7 +1,7 @@
 // Images: the bitmaps of the page's images, loaded in the background.
 // Owner:   the application; destroyed before its queue.
 // Thread:  the window's; wake is called on the loader's thread when Poll has something new.
-// Limits:  kMaxFiles files and kMaxPixels pixels together, as a scene has them.
+// Limits:  as many files, and pixels together, as a scene may have.
 #pragma once
 
 #include "moka/base/RefPtr.h"
@@ -20,9 +20,6 @@ namespace Moka::Notebook {
 
 class Images {
 public:
-    static constexpr std::size_t kMaxFiles = 64;
-    static constexpr std::int64_t kMaxPixels = std::int64_t{64} << 20; // 256 MiB
-
     Images(IGLMsgQueue& queue, std::function<void()> wake);
     ~Images();
 

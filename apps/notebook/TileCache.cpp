@@ -77,8 +77,9 @@ bool TileCache::ShowExact(IMKCanvas& screen, Viewport const& view, int pageHeigh
     for (int row = top; row <= bottom; ++row) {
         for (int column = left; column <= right; ++column) {
             Place const place(column, row);
-            if (mNow.tiles.count(place) == 0) mNow.tiles.emplace(place, MakeTile());
-            Tile& tile = mNow.tiles.at(place);
+            auto found = mNow.tiles.find(place);
+            if (found == mNow.tiles.end()) found = mNow.tiles.emplace(place, MakeTile()).first;
+            Tile& tile = found->second;
             tile.seen = mFrame;
             if (tile.isStale && objects < kObjectsAFrame && tile.canvas) {
                 Prepare(tile, place);
