@@ -14,7 +14,8 @@ double ToMilliseconds(std::int64_t nanoseconds) { return static_cast<double>(nan
 
 } // namespace
 
-Frames::Frames(RenderThread& queue, bool isCounting) : mQueue(queue) {
+Frames::Frames(RenderThread& queue, bool isCounting, std::function<void()> notify)
+    : mQueue(queue), mNotify(std::move(notify)) {
     if (isCounting) mShown.reserve(kMaxFrames);
 }
 
@@ -23,7 +24,8 @@ void Frames::Mark(std::uint32_t age) {
 }
 
 void Frames::End() {
-    WorkerTask::PostMember(&mQueue, this, &Frames::Finish, mBegin, mInput);
+    mIsInFlight = true;
+    if (!WorkerTask::PostMember(&mQueue, this, &Frames::Finish, mBegin, mInput)) mIsInFlight = false;
     mInput = 0;
 }
 
@@ -33,6 +35,8 @@ void Frames::Finish(std::int64_t begin, std::int64_t input) {
     Trace::NameTask("frame shown");
     if (input != 0) Trace::Add("notebook", "input to swap", input, now, nullptr, 0);
     if (mShown.size() < mShown.capacity()) mShown.push_back({begin, input, now});
+    mIsInFlight = false;
+    mNotify();
 }
 
 void Frames::PrintTimes(char const* what, std::vector<double> times) {

@@ -7,6 +7,7 @@
 
 #include <atomic>
 #include <cstdint>
+#include <functional>
 #include <vector>
 
 namespace Moka::Notebook {
@@ -15,13 +16,16 @@ class Frames {
 public:
     static constexpr std::size_t kMaxFrames = 100'000; // that are counted
 
-    Frames(RenderThread& queue, bool isCounting);
+    // notify is called on the render thread when a frame has been shown.
+    Frames(RenderThread& queue, bool isCounting, std::function<void()> notify);
 
     // Input that the next frame shows; `age` in milliseconds. The oldest counts.
     void Mark(std::uint32_t age);
     void Begin() { mBegin = Trace::GetTime(); }
     // Right after Present.
     void End();
+    // While it is, input is collected for the next frame: what is requested now would only wait.
+    bool IsInFlight() const { return mIsInFlight; }
     // Once the render thread has nothing more to do.
     void Print() const;
 
@@ -35,6 +39,8 @@ private:
     static void PrintTimes(char const* what, std::vector<double> times);
 
     RenderThread& mQueue;
+    std::function<void()> const mNotify;
+    std::atomic<bool> mIsInFlight{false};
     std::int64_t const mStart = Trace::GetTime();
     std::int64_t mBegin = 0;
     std::int64_t mInput = 0;

@@ -33,30 +33,29 @@ Notebook::Notebook(Options const& options, SDL_Window* window, RenderThread& que
                      MoveView();
                  },
                  [this](std::string const& message, bool isError) { Tell(message, isError); },
-                 [this] {
-                     SDL_Event event{};
-                     event.type = mWakeEvent;
-                     SDL_PushEvent(&event);
-                 }},
+                 [this] { Wake(); }},
                 static_cast<std::uint32_t>(options.autosave * 1000)),
-      mImages(queue,
-              [this] {
-                  SDL_Event event{};
-                  event.type = mWakeEvent;
-                  SDL_PushEvent(&event);
-              }),
+      mImages(queue, [this] { Wake(); }),
       mPainter(mDocument.GetPage(), mImages),
       mTools(mDocument.GetPage(), mPainter),
       mTiles(queue, static_cast<std::size_t>(options.cache) << 20,
              [this](IMKCanvas& canvas, RectF const& area) { return mPainter.Paint(canvas, area); }),
       mInput(window, *this),
       mRecorder(options.record),
-      mFrames(queue, options.statistics) {
+      mFrames(queue, options.statistics, [this] { Wake(); }) {
     mView.top = Toolbar::kHeight;
     Show();
 }
 
-Notebook::~Notebook() = default;
+// Frames and images may still be on their way to members.
+Notebook::~Notebook() { mQueue.WaitForTasks(); }
+
+// Any thread.
+void Notebook::Wake() const {
+    SDL_Event event{};
+    event.type = mWakeEvent;
+    SDL_PushEvent(&event);
+}
 
 int Notebook::Run() {
     std::string reason;
@@ -66,7 +65,7 @@ int Notebook::Run() {
     mDocument.Open(mOptions.page.empty() ? Document::GetLastPath() : mOptions.page);
     while (mIsRunning) {
         Work();
-        if (mIsRunning && mIsDirty) DrawFrame();
+        if (mIsRunning && mIsDirty && !mFrames.IsInFlight()) DrawFrame();
     }
     mQueue.WaitForTasks();
     if (mOptions.statistics) {
@@ -97,7 +96,8 @@ void Notebook::Work() {
     auto const sooner = [&wait](int other) {
         wait = wait < 0 || (other >= 0 && other < wait) ? other : wait;
     };
-    bool const isIdle = !mIsDirty && !mImages.IsBusy() && !mDocument.IsBusy() && !IsZooming();
+    bool const isIdle =
+        !mIsDirty && !mFrames.IsInFlight() && !mImages.IsBusy() && !mDocument.IsBusy() && !IsZooming();
     if (mReplay.IsActive()) sooner(mReplay.Pump(mWindow, isIdle));
     if (IsZooming()) sooner(static_cast<int>(kZoomRest - std::min(kZoomRest, now - mZoomedAt)) + 1);
     if (!mMessage.empty() && !mIsError && now - mToldAt >= kMessageTime) {
@@ -106,7 +106,7 @@ void Notebook::Work() {
     } else if (!mMessage.empty() && !mIsError) {
         sooner(static_cast<int>(kMessageTime - (now - mToldAt)));
     }
-    WaitForInput(mIsDirty ? 0 : wait);
+    WaitForInput(mIsDirty && !mFrames.IsInFlight() ? 0 : wait);
 }
 
 void Notebook::WaitForInput(int milliseconds) {

@@ -60,6 +60,7 @@ private:
     void Tell(std::string const& message, bool isError);
     void PageHasChanged(Splice const& splice);
 
+    void Wake() const;
     void WaitForInput(int milliseconds);
     void Work();
     bool IsZooming() const;
