@@ -2,6 +2,7 @@
 #include "moka/graphics/drawable/MKBlendedBitmapDrawable.h"
 #include "moka/graphics/drawable/MKGaussianBlurDrawable.h"
 #include "moka/graphics/drawable/MKNonPremultipliedColorDrawable.h"
+#include "moka/graphics/drawable/MKStrokeDrawable.h"
 #include "moka/graphics/drawable/MKTextMaskBitmapDrawable.h"
 #include "moka/graphics/paint/MKPaint.h"
 
@@ -90,7 +91,7 @@ void DrawShape(CanvasWorld& world) {
 
 IMKCustomDrawable* NewDrawable(CanvasWorld& world) {
     FuzzInput& input = world.input;
-    int const kind = input.Below(4);
+    int const kind = input.Below(5);
     IMKBitmap* const first = world.PickBitmapFor(false);
     IMKBitmap* const second = world.PickBitmapFor(false);
     if (kind == 0) {
@@ -111,6 +112,14 @@ IMKCustomDrawable* NewDrawable(CanvasWorld& world) {
         mask->SetBitmap(first);
         mask->SetDstPosition(input.Float(), input.Float());
         return mask;
+    }
+    if (kind == 3) {
+        auto* const stroke = new MKStrokeDrawable(&world.queue);
+        for (int i = input.Below(12); i > 0; --i) {
+            MKStrokePoint const point{input.Float(), input.Float(), input.Float()};
+            stroke->Append(&point, input.Below(2));
+        }
+        return stroke;
     }
     RectF const src = ReadRectF(input);
     RectF const dst = ReadRectF(input);

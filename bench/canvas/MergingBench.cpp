@@ -82,6 +82,22 @@ void Buttons(benchmark::State& state) {
     });
 }
 
+// Two programs in turn, in rows of 64. With a step below their size each touches its neighbours.
+void RoundRects(benchmark::State& state, int size, int step) {
+    constexpr int kRoundRects = 4000;
+    BenchCanvas target;
+    MKPaint paint;
+    Measure(state, kRoundRects, [&] {
+        for (int i = 0; i < kRoundRects; ++i) {
+            float const x = static_cast<float>(i % 64 * step);
+            float const y = static_cast<float>(i / 64 * step);
+            float const side = static_cast<float>(size);
+            SetColor(paint, ColorOf(i, Colors::Distinct));
+            target.canvas->DrawRoundRect({x, y, x + side, y + side}, side / 4, side / 4, &paint);
+        }
+    });
+}
+
 // Everything that is drawn touches what was drawn before; integers differ from draw to draw.
 void OverlappingCircles(benchmark::State& state) {
     BenchCanvas target;
@@ -180,6 +196,8 @@ BENCHMARK_CAPTURE(ClippedRects, three_rotated, 3, false, ClipLog::Dropped)->Appl
 BENCHMARK_CAPTURE(ClippedRects, ten_rotated, 10, false, ClipLog::Dropped)->Apply(Configure);
 BENCHMARK_CAPTURE(ClippedRects, one_of_its_own_each, 1, true, ClipLog::Dropped)->Apply(Configure);
 BENCHMARK(Buttons)->Apply(Configure);
+BENCHMARK_CAPTURE(RoundRects, apart, 14, 16)->Apply(Configure);
+BENCHMARK_CAPTURE(RoundRects, overlapping, 14, 8)->Apply(Configure);
 BENCHMARK(OverlappingCircles)->Apply(Configure);
 BENCHMARK(PageOfStrokes)->Apply(Configure);
 BENCHMARK(ManyRects)->RangeMultiplier(10)->Range(1000, 1'000'000)->Apply(Configure);

@@ -74,7 +74,8 @@ public:
     explicit BarePage(Ink ink) {
         for (int i = 0; i < kStrokes; ++i) {
             std::vector<MKStrokePoint> const points = PointsOf(i);
-            for (std::size_t k = 0; k + 1 < points.size(); ++k) Write(points[k], points[k + 1], InkOf(i, ink));
+            for (std::size_t k = 0; k + 1 < points.size(); ++k)
+                Write(points[k], points[k + 1], InkOf(i, ink));
         }
     }
 
@@ -94,12 +95,14 @@ private:
         float const length = std::hypot(b.x - a.x, b.y - a.y);
         float const x = (b.x - a.x) / length * reach;
         float const y = (b.y - a.y) / length * reach;
-        PointF const corners[] = {{a.x - x - y, a.y - y + x}, {b.x + x - y, b.y + y + x},
-                                  {a.x - x + y, a.y - y - x}, {b.x + x + y, b.y + y - x}};
+        PointF const corners[] = {{a.x - x - y, a.y - y + x},
+                                  {b.x + x - y, b.y + y + x},
+                                  {a.x - x + y, a.y - y - x},
+                                  {b.x + x + y, b.y + y - x}};
         for (int const corner : {0, 1, 2, 2, 1, 3}) {
-            mFloats.insert(mFloats.end(), {corners[corner].x, corners[corner].y, a.x, a.y, b.x, b.y,
-                                           color.x * color.w, color.y * color.w, color.z * color.w, color.w,
-                                           radius});
+            mFloats.insert(mFloats.end(),
+                           {corners[corner].x, corners[corner].y, a.x, a.y, b.x, b.y, color.x * color.w,
+                            color.y * color.w, color.z * color.w, color.w, radius});
         }
     }
 
@@ -160,8 +163,8 @@ void Append(benchmark::State& state) {
         counters.Add(MeasureFrame([&] {
             for (int i = 0; i < count; ++i) {
                 auto const at = static_cast<float>(i);
-                MKStrokePoint const point{600 + 550 * std::sin(at * 0.0013f), 800 + 700 * std::sin(at * 0.0017f),
-                                          4};
+                MKStrokePoint const point{600 + 550 * std::sin(at * 0.0013f),
+                                          800 + 700 * std::sin(at * 0.0017f), 4};
                 stroke->Append(&point, 1);
             }
             target.canvas->Draw(stroke.Get(), &paint);

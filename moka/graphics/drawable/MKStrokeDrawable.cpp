@@ -9,6 +9,7 @@
 
 #include <algorithm>
 #include <cmath>
+#include <initializer_list>
 #include <iterator>
 #include <new>
 #include <utility>
@@ -21,7 +22,7 @@ namespace {
 
 constexpr float kFarthest = 4194304.0f;
 
-// Of a cell, four of them; the last float of the corner is that of the cell and the number of the corner.
+// A corner of a cell; code is 4 * the cell's segments + the number of the corner.
 struct StrokeVertex {
     float x;
     float y;
@@ -50,10 +51,15 @@ std::vector<MKStrokePoint> CopyKept(MKStrokePoint const* points, int count) {
 StrokeVertex* WriteCell(StrokeVertex* at, StrokeCell const& cell) {
     StrokeVertex vertex{cell.x, cell.y, cell.side, 0, {}};
     std::copy(std::begin(cell.points), std::end(cell.points), vertex.points);
-    for (int const corner : {0, 1, 2, 2, 1, 3}) {
-        vertex.code = cell.segments * 4 + static_cast<float>(corner);
-        *at++ = vertex;
-    }
+    auto const write = [&](std::initializer_list<int> corners) {
+        for (int const corner : corners) {
+            vertex.code = cell.segments * 4 + static_cast<float>(corner);
+            *at++ = vertex;
+        }
+    };
+    int const parts = static_cast<int>(cell.segments);
+    if ((parts & StrokeCell::kUpperLeft) != 0) write({0, 1, 2});
+    if ((parts & StrokeCell::kLowerRight) != 0) write({2, 1, 3});
     return at;
 }
 
@@ -69,7 +75,7 @@ void DrawCells(IGraphicsObject& graphics, std::vector<StrokeCell> const& cells, 
     for (StrokeCell const& cell : cells) {
         if (cell.side == 0) continue;
         end = WriteCell(end, cell);
-        if (end == std::end(vertices)) draw();
+        if (std::end(vertices) - end < kQuadVertices) draw();
     }
     if (end != vertices) draw();
     // Without vertices there are none to keep when the list is flushed.
@@ -113,6 +119,12 @@ MKStrokeDrawable::MKStrokeDrawable(IGLMsgQueue* queue)
       mStroke(std::make_unique<StrokeRT>()) {}
 
 MKStrokeDrawable::~MKStrokeDrawable() = default;
+
+// Draws read the points; what changes them is posted by the thread that waits here.
+std::vector<MKStrokePoint> MKStrokeDrawable::ReadPoints() {
+    if (mQueue) mQueue->WaitForTasks();
+    return mStroke->GetPoints();
+}
 
 void MKStrokeDrawable::Append(MKStrokePoint const* points, int count) {
     if (!points || count < 1 || !mQueue) return;

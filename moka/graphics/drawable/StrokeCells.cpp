@@ -54,10 +54,10 @@ std::vector<StrokeCell> const& StrokeCells::Make() {
 StrokeCells::Candidate StrokeCells::Judge(int segment, Square const& square) const {
     StrokeSegment const& judged = mSegments[At(segment)];
     double const half = square.side * 0.5;
-    auto const [distance, radius] = judged.Find(square.x + half, square.y + half);
     double const reach = half * 1.41422;
-    double const edge = distance - radius;
-    return {segment, edge - reach, edge + reach, distance - reach, distance + reach};
+    double const edge = judged.GetEdge(square.x + half, square.y + half);
+    double const gap = judged.GetGap(square.x + half, square.y + half, half) - judged.GetGreatestRadius();
+    return {segment, std::max(edge - reach, gap), edge + reach};
 }
 
 bool StrokeCells::IsOutside(Candidate const& candidate) const {
@@ -71,6 +71,15 @@ bool StrokeCells::IsFull(Candidate const& candidate) const {
     return candidate.most <= -half && mSegments[At(candidate.segment)].GetLeastRadius() >= half;
 }
 
+// The distance to a convex shape is a convex function, so a corner is farthest.
+double StrokeCells::FindMost(Candidate const& candidate, Square const& square) const {
+    StrokeSegment const& segment = mSegments[At(candidate.segment)];
+    double const right = square.x + square.side;
+    double const bottom = square.y + square.side;
+    return std::max({segment.GetEdge(square.x, square.y), segment.GetEdge(right, square.y),
+                     segment.GetEdge(square.x, bottom), segment.GetEdge(right, bottom)});
+}
+
 // Whether best covers each pixel of the square as much as the candidate.
 bool StrokeCells::IsBeaten(Candidate const& candidate, Candidate const& best) const {
     if (!mScale.isEven || best.most > candidate.least) return false;
@@ -79,7 +88,8 @@ bool StrokeCells::IsBeaten(Candidate const& candidate, Candidate const& best) co
     StrokeSegment const& loser = mSegments[At(candidate.segment)];
     // Neither fades.
     if (winner.GetLeastRadius() >= half && loser.GetLeastRadius() >= half) return true;
-    return best.mostDistance <= candidate.leastDistance &&
+    double const most = best.most + winner.GetGreatestRadius();
+    return most <= candidate.least + loser.GetLeastRadius() &&
            winner.GetLeastRadius() >= kAsWide * loser.GetGreatestRadius();
 }
 
@@ -229,7 +239,7 @@ void StrokeCells::MakeNode(int node, Square const& square) {
     FreeCells(node);
     mCandidates.clear();
     for (int i = mNodes[At(node)].entries; i != kNone; i = mEntries[At(i)].next) {
-        mCandidates.push_back({mEntries[At(i)].segment, 0, 0, 0, 0});
+        mCandidates.push_back({mEntries[At(i)].segment, 0, 0});
     }
     std::reverse(mCandidates.begin(), mCandidates.end());
     MakePart(node, square, 0);
@@ -256,8 +266,9 @@ void StrokeCells::MakePart(int node, Square const& square, std::size_t begin) {
     std::size_t const end = mCandidates.size();
     std::size_t best = end;
     for (std::size_t i = begin; i < end; ++i) {
-        Candidate const candidate = Judge(mCandidates[i].segment, square);
+        Candidate candidate = Judge(mCandidates[i].segment, square);
         if (IsOutside(candidate)) continue;
+        candidate.most = FindMost(candidate, square);
         if (IsFull(candidate)) {
             mCandidates.resize(end);
             mCandidates.push_back(candidate);
@@ -290,18 +301,13 @@ void StrokeCells::MakeCell(int node, Square const& square, std::size_t begin) {
     auto const from = mCandidates.begin() + static_cast<std::ptrdiff_t>(begin);
     auto const isEarlier = [](Candidate const& a, Candidate const& b) { return a.segment < b.segment; };
     if (CountPoints(from, mCandidates.end()) > StrokeCell::kPoints) {
-        std::sort(from, mCandidates.end(),
-                  [](Candidate const& a, Candidate const& b) { return a.most < b.most; });
-        std::size_t count = std::min(mCandidates.size() - begin, kCellSegments);
-        std::array<Candidate, kCellSegments> nearest{};
+        auto const isNearer = [](Candidate const& a, Candidate const& b) { return a.most < b.most; };
+        std::size_t count = kCellSegments + 1;
         do {
-            std::copy_n(from, count, nearest.begin());
-            std::sort(nearest.begin(), nearest.begin() + static_cast<std::ptrdiff_t>(count), isEarlier);
-        } while (CountPoints(nearest.begin(), nearest.begin() + static_cast<std::ptrdiff_t>(count)) >
-                     StrokeCell::kPoints &&
-                 --count > 0);
-        std::copy_n(nearest.begin(), count, from);
-        mCandidates.resize(begin + count);
+            std::sort(from, mCandidates.end(), isNearer);
+            mCandidates.resize(std::min(mCandidates.size(), begin + --count));
+            std::sort(from, mCandidates.end(), isEarlier);
+        } while (CountPoints(from, mCandidates.end()) > StrokeCell::kPoints);
     }
     StrokeCell& cell = mCells[At(TakeCell(node))];
     cell = {};
@@ -311,7 +317,7 @@ void StrokeCells::MakeCell(int node, Square const& square, std::size_t begin) {
     int points = 0;
     int joined = 0;
     auto const put = [&](StrokeNode const& point) {
-        float* const at = cell.points + 3 * points++;
+        float* const at = cell.points + std::ptrdiff_t{3} * points++;
         at[0] = static_cast<float>(point.x - square.x);
         at[1] = static_cast<float>(point.y - square.y);
         at[2] = static_cast<float>(point.radius);
@@ -319,12 +325,27 @@ void StrokeCells::MakeCell(int node, Square const& square, std::size_t begin) {
     int last = -2;
     for (std::size_t i = begin; i < mCandidates.size(); ++i) {
         int const segment = mCandidates[i].segment;
-        if (segment != last + 1) put(mSegments[At(segment)].a);
+        if (points == 0 || segment != last + 1) put(mSegments[At(segment)].a);
         joined |= 1 << (points - 1);
         put(mSegments[At(segment)].b);
         last = segment;
     }
-    cell.segments = static_cast<float>(joined);
+    cell.segments = static_cast<float>(joined | FindHalves(square, begin));
+}
+
+// Of a segment that lies on one side of the diagonal, with its radius and its fringe.
+int StrokeCells::FindHalves(Square const& square, std::size_t begin) const {
+    double const middle = square.x + square.y + square.side;
+    int halves = 0;
+    for (std::size_t i = begin; i < mCandidates.size(); ++i) {
+        StrokeSegment const& segment = mSegments[At(mCandidates[i].segment)];
+        double const a = segment.a.x + segment.a.y - middle;
+        double const b = segment.b.x + segment.b.y - middle;
+        double const reach = GetReach(segment, mScale) * 1.41422;
+        if (std::min(a, b) < reach) halves |= StrokeCell::kUpperLeft;
+        if (std::max(a, b) > -reach) halves |= StrokeCell::kLowerRight;
+    }
+    return halves;
 }
 
 int StrokeCells::TakeCell(int node) {

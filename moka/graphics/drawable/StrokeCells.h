@@ -11,13 +11,15 @@
 
 #include "moka/graphics/drawable/StrokeSegment.h"
 
-#include <array>
 #include <vector>
 
 namespace Moka::detail {
 
 struct StrokeCell {
     static constexpr int kPoints = 6;
+    // Of segments: the triangles that are not empty.
+    static constexpr int kUpperLeft = 32;
+    static constexpr int kLowerRight = 64;
 
     float x; // of the left upper corner
     float y;
@@ -65,13 +67,12 @@ private:
     };
     struct Candidate {
         int segment;
-        double least; // distance minus radius in the square
-        double most;
-        double leastDistance;
-        double mostDistance;
+        double least; // at least so far all of the square lies outside of the segment's edge
+        double most;  // at most; negative inside
     };
 
     Candidate Judge(int segment, Square const& square) const;
+    double FindMost(Candidate const& candidate, Square const& square) const;
     bool IsOutside(Candidate const& candidate) const;
     bool IsFull(Candidate const& candidate) const;
     bool IsBeaten(Candidate const& candidate, Candidate const& best) const;
@@ -89,6 +90,7 @@ private:
     void MakeNode(int node, Square const& square);
     void MakePart(int node, Square const& square, std::size_t begin);
     void MakeCell(int node, Square const& square, std::size_t begin);
+    int FindHalves(Square const& square, std::size_t begin) const;
     int TakeCell(int node);
 
     StrokeScale const mScale;

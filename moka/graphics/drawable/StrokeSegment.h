@@ -58,6 +58,23 @@ struct StrokeSegment {
         double const along = (x - a.x) * lineX + (y - a.y) * lineY;
         return Measure(x, y, square > 0 ? std::clamp(along / square, 0.0, 1.0) : 0.0);
     }
+    // How far outside of the edge; negative inside.
+    double GetEdge(double x, double y) const {
+        Nearest const nearest = Find(x, y);
+        return nearest.distance - nearest.radius;
+    }
+    // Not more than the distance of the line from a square around a point.
+    double GetGap(double x, double y, double half) const {
+        double const lineX = b.x - a.x;
+        double const lineY = b.y - a.y;
+        double const beside = std::max(std::min(a.x, b.x) - x, x - std::max(a.x, b.x)) - half;
+        double const above = std::max(std::min(a.y, b.y) - y, y - std::max(a.y, b.y)) - half;
+        double const ends = std::hypot(std::max(beside, 0.0), std::max(above, 0.0));
+        double const length = GetLength();
+        if (length == 0) return ends;
+        double const across = std::fabs((x - a.x) * lineY - (y - a.y) * lineX);
+        return std::max(ends, (across - half * (std::fabs(lineX) + std::fabs(lineY))) / length);
+    }
     double GetLength() const { return std::hypot(b.x - a.x, b.y - a.y); }
     double GetGreatestRadius() const { return std::max(a.radius, b.radius); }
     double GetLeastRadius() const { return std::min(a.radius, b.radius); }

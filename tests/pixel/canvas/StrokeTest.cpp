@@ -283,8 +283,8 @@ TEST_F(StrokeTest, StripsAndClipsCutWithoutATrace) {
         for (int x = 0; x < kWidth; ++x) {
             bool const inside = x >= 20 && x < 90 && y >= 15 && y < 75;
             ASSERT_EQ(cut.GetColor(x, y), (inside ? plain : start).GetColor(x, y)) << x << ", " << y;
-            bool const isOne =
-                turned.GetColor(x, y) == plain.GetColor(x, y) || turned.GetColor(x, y) == start.GetColor(x, y);
+            bool const isOne = turned.GetColor(x, y) == plain.GetColor(x, y) ||
+                               turned.GetColor(x, y) == start.GetColor(x, y);
             ASSERT_TRUE(isOne) << x << ", " << y;
             drawn += turned.GetColor(x, y) == start.GetColor(x, y) ? 0 : 1;
         }
@@ -310,10 +310,13 @@ TEST_F(StrokeTest, AppendingPieceByPieceDrawsTheSameStroke) {
         Picture const pieces =
             Draw({Picture(kWidth, kHeight), [&](IMKCanvas& canvas, Scenes::SceneStage& stage) {
                       auto const stroke = MakeStroke(stage, {{1, 1, 30}});
-                      stroke->Clear();
                       MKPaint const paint;
+                      canvas.Draw(stroke.Get(), &paint);
+                      stroke->Clear();
+                      int left = static_cast<int>(points.size());
                       for (MKStrokePoint const& point : points) {
                           stroke->Append(&point, 1);
+                          if (--left % 7 != 0) continue;
                           // At two scales in turn, so that both meshes grow.
                           canvas.ClearAll(0);
                           canvas.PreScale(0.3f, 0.3f);
