@@ -1,0 +1,56 @@
+// Behaviour of docs/compatibility.md that no other test sees.
+#include "moka/graphics/loader/MKBitmapSaveManager.h"
+#include "tests/unit/canvas/CanvasFixture.h"
+
+namespace Moka::Testing {
+namespace {
+
+using Compatibility = CanvasFixture;
+
+TEST_F(Compatibility, ABatchUsesTheFirstStrips) {
+    Use(NewBitmap(60, kMaxSide + 36));
+    auto const source = NewBitmap(10, 10);
+    canvas->DrawBitmaps(source.Get(), {RectF(1, 2, 3, 4), RectF(0, 70, 9, 80)}, &paint);
+    TracedDraw const draw = TakeDraw();
+    EXPECT_EQ(draw.target, "target 1");
+    EXPECT_EQ(draw.count, 12) << "also the one that lies on the second strip";
+}
+
+TEST_F(Compatibility, StrokesUnderOneDrawNothingButCircles) {
+    Use(NewBitmap(60, 60));
+    paint.SetStyle(MKPaint::Stroke);
+    paint.SetLineWidth(0.9f);
+    canvas->DrawRect(5, 5, 30, 30, &paint);
+    canvas->DrawRoundRect(5, 5, 30, 30, 4, 4, &paint);
+    canvas->DrawLine(5, 5, 30, 30, &paint);
+    for (TracedDraw const& draw : TakeDraws()) EXPECT_EQ(draw.vertices, Numbers());
+    canvas->DrawCircle(20, 20, 12, &paint);
+    EXPECT_FALSE(TakeDraw().vertices.empty());
+}
+
+TEST_F(Compatibility, AShorterTagOfACanvasKeepsTheEndOfALongerOne) {
+    Use(NewBitmap(8, 8));
+    canvas->SetTag(std::string(200, 'x').c_str());
+    canvas->SetTag("abc");
+    EXPECT_EQ(canvas->GetTag(), "abc" + std::string(123, 'x'));
+}
+
+TEST_F(Compatibility, SamplingOfATextureBitmapDropsNoReference) {
+    auto const bitmap = NewBitmap(4, 4);
+    queue.RunAll();
+    OnRenderThread const here;
+    bitmap->GetBitmapReadable()->SetTextureFilterRT(TextureFilterNearest, true);
+    bitmap->GetBitmapReadable()->SetTextureWrapRT(TextureWrapRepeat, true);
+    EXPECT_EQ(CountOf(bitmap.Get()), 1);
+}
+
+TEST_F(Compatibility, ASaveThatTheLoaderRefusesStaysCounted) {
+    auto const empty = BitmapPtr::Adopt(
+        MKGraphicsFactory::CreateBitmap(&queue, reinterpret_cast<TextureObject const*>(this), 1));
+    MKBitmapSaveManager manager;
+    EXPECT_FALSE(manager.RequestSave(1, "a.png", *empty, nullptr, 100));
+    EXPECT_EQ(manager.GetRequestSaveCount(), 1);
+}
+
+} // namespace
+} // namespace Moka::Testing
