@@ -21,14 +21,17 @@
 
 namespace Moka {
 
+/// A named number or text of an event.
 struct TraceArgument {
+    /// The name, and the number unless text is set.
     char const* key;
     std::int64_t number;
-    char const* text; // in the place of the number unless null
+    char const* text; ///< in the place of the number unless null
 };
 
 class MOKA_API Trace {
 public:
+    /// The most arguments of one event.
     static constexpr int kMaxArguments = 4;
 
     /// Replaces the file. False, with the reason, when it cannot be opened or a trace is running. error may be
@@ -38,8 +41,10 @@ public:
     /// a trace it does nothing: true. The end of the process stops the trace, too.
     static bool Stop(std::string* error);
 
+    /// Whether a trace is running.
     static bool IsOn() noexcept { return theIsOn.load(std::memory_order_relaxed); }
 
+    /// Nanoseconds of the steady clock.
     static std::int64_t GetTime() noexcept;
     /// An event of this thread. Ignored when it began before the trace. Of more arguments than kMaxArguments the
     /// first are taken.
@@ -62,7 +67,9 @@ private:
 class TraceScope {
 public:
     // cppcheck-suppress uninitMemberVar ; only mIsOn is written while the trace is off
+    /// Begins the event.
     TraceScope(char const* category, char const* name) noexcept : TraceScope(Trace::IsOn(), category, name) {}
+    /// The same with an argument.
     TraceScope(char const* category, char const* name, char const* key, std::uint64_t number) noexcept
         : TraceScope(category, name) {
         Set(key, number);
@@ -73,6 +80,7 @@ public:
     TraceScope(TraceScope const&) = delete;
     TraceScope& operator=(TraceScope const&) = delete;
 
+    /// Adds an argument.
     void Set(char const* key, std::uint64_t number) noexcept {
         Append({key, static_cast<std::int64_t>(number), nullptr});
     }
