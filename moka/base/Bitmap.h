@@ -1,7 +1,7 @@
 /// Bitmap: a CPU image over one pixel buffer.
 /// Units:  pixels, first row first; format 1 is RGBA8, premultiplied, four bytes a pixel. Stride is in bytes.
 /// Owner:  the buffer is `new unsigned char[]`; it is freed with array delete on destruction while the
-///         delete-buffer switch is on, and otherwise belongs to whoever switched it off.
+///         delete-buffer switch is on, and otherwise belongs to the code that switched it off.
 /// Thread: not synchronised.
 #pragma once
 
@@ -19,7 +19,7 @@ public:
     virtual ~Bitmap();
 
     /// Takes the buffer over as it is, or a copy of its pixels at stride width * 4 (copyPixels: the bitmap
-    /// then owns its copy, whatever deleteBuffer says, and the buffer stays the caller's). False, with the
+    /// then owns its copy, regardless of deleteBuffer, and the buffer stays the caller's). False, with the
     /// bitmap and the buffer untouched, when the bitmap already has pixels, the buffer is null, a side is
     /// below 1, the stride is below width * 4, the format is not 1, or the copy cannot be allocated.
     bool Construct(unsigned char* buffer, int width, int height, int stride, int format, bool copyPixels,

@@ -3,16 +3,17 @@
 /// memory always RGBA8, premultiplied, sRGB, stride width * 4, in a buffer the bitmap owns. Colours: what a
 /// file says of them (an ICC profile; a PNG's gamma and primaries) is converted to sRGB, 8 bits a channel; a
 /// file that says nothing keeps every byte. A profile that cannot be used is ignored, with one warning. Of an
-/// animated WebP the first frame is decoded, of an animated PNG its default image. Not applied: the orientation
-/// that a camera notes; rows come as they are stored.
+/// animated WebP the first frame is decoded, of an animated PNG its default image. Not applied: the
+/// orientation that a camera notes; rows come as they are stored.
 /// Thread:  any; no state.
-/// Fails:   null or false, and one error line, "cannot read image 'name': reason" or "cannot save ...", whose
-///          name is masked outside engineering builds (Log::ConvertSecureLog). Nothing is left behind: a decode
-///          frees what it had, an encode writes a temporary file beside the target, flushes it and renames.
+/// Fails:   null or false, and logs an error, "cannot read image 'name': reason" or "cannot save ...", whose
+///          name is masked outside engineering builds (Log::ConvertSecureLog). Nothing is left behind: a
+///          decode frees what it had, an encode writes a temporary file beside the target, flushes it and
+///          renames.
 /// Reason:  the overloads with one more argument also fill it with the reason alone, for callers who may name
 ///          the file. It is untouched on success.
 /// Limits:  no side above 65,535, no image above 1 GiB decoded, checked before anything is allocated.
-/// Cost:    one decoded copy at a time, plus what the codec needs for a row or a block.
+/// Cost:    one decoded copy at a time, plus the codec's buffers for a row or a block.
 #pragma once
 
 #include "moka/base/Export.h"
@@ -29,7 +30,7 @@ class String;
 /// The formats of image files.
 enum class ImageFormat { Unknown, Png, Jpeg, Webp, Mki };
 
-/// What a file says about itself before its pixels are decoded.
+/// The header of an image file.
 struct ImageInfo {
     /// As the file's header says. Sizes in pixels.
     ImageFormat format = ImageFormat::Unknown;
@@ -65,7 +66,7 @@ public:
     static Bitmap* CreateBitmapFromBuffer(unsigned char* buffer, int width, int height, int stride,
                                           int format, bool deleteBuffer);
 
-    /// quality is 0 ... 100 (clamped) and means what the codec means by it: JPEG's and WebP's own scale (WebP:
+    /// quality is 0 ... 100 (clamped), on the codec's scale: JPEG's and WebP's own scale (WebP:
     /// 100 is lossless), ignored by PNG and "mki". JPEG is flattened on white.
     static bool SaveBitmap(Bitmap const* bitmap, String const* path, int quality);
     static bool SaveBitmap(Bitmap const* bitmap, String const* path, int quality, std::string* reason);

@@ -1,7 +1,7 @@
-/// Handler: delivers messages to a function on the thread that made it, through that thread's MessageLoop.
-/// A handler made on a thread without a loop logs an error and refuses every message.
-/// Thread: SendMessage and HasMessage from any. Destruction withdraws pending messages and waits for a running
-///         one, unless it happens on the loop's own thread, where the message can only be one that is
+/// Handler: delivers messages to a function on the thread that created it, through that thread's MessageLoop.
+/// A handler created on a thread without a loop logs an error and refuses every message.
+/// Thread: SendMessage and HasMessage from any. Destruction withdraws pending messages and waits for a
+///         running one, unless it happens on the loop's own thread, where the message can only be one that is
 ///         destroying it.
 #pragma once
 

@@ -15,7 +15,7 @@ namespace Moka {
 template <class T>
 class List {
 public:
-    /// Completes construction; false when memory for it cannot be had. May be called once.
+    /// Completes construction; false without memory. May be called once.
     bool Construct() { return true; }
 
     /// The number of items.
@@ -29,7 +29,7 @@ public:
         return index >= 0 && at < mItems.size() ? mItems[at] : nullptr;
     }
 
-    /// False, with the list unchanged, when memory for the item cannot be had.
+    /// False, with the list unchanged, without memory for the item.
     [[nodiscard]] bool Add(T* item) {
         try {
             mItems.push_back(item);

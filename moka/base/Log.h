@@ -1,4 +1,4 @@
-/// Log: helpers for what may stand in a log line.
+/// Log: hides file names in log lines.
 #pragma once
 
 #include "moka/base/Export.h"

@@ -1,5 +1,5 @@
 /// RefCount: an atomic reference count that deletes its object when the last reference goes.
-/// Owner:   starts at one, which belongs to whoever created the object.
+/// Owner:   starts at one, which belongs to the creator.
 /// Thread:  any. The last Unref sees everything that other threads did before theirs.
 /// Usable as a public, private or second base: the object is deleted through the virtual destructor.
 #pragma once

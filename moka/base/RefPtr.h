@@ -1,5 +1,5 @@
 /// RefPtr: holds one reference on an object with Ref() and Unref().
-/// Adopting takes over a reference that the caller already has; sharing takes one more.
+/// Adopt takes over a reference of the caller's, Share takes a new one.
 #pragma once
 
 #include <utility>

@@ -1,8 +1,8 @@
 /// TaskQueue: the queue half of a render thread: any thread posts, one thread runs. An intrusive list under
 /// one short lock, taken over whole by the consumer and notified only when it sleeps; posting allocates
 /// nothing.
-/// Owner:   whoever makes it; it must outlive every post. Tasks that were never run are freed with it, and
-///          threads that still wait for them are let go.
+/// Owner:   the creator; it must outlive every post. Tasks that were never run are freed with it, and
+///          threads that still wait for them return.
 /// Thread:  Post and WaitForTasks from any; Run once, on the one consumer thread. No lock is held while a
 ///          task runs or is freed.
 /// Order:   posting order.
@@ -35,12 +35,12 @@ public:
     void WaitForTasks() override;
 
 protected:
-    /// Runs tasks until RequestStop(), then what was accepted and what those tasks post, then refuses and
-    /// returns. onIdle is called each time the queue has run empty, before sleeping or returning; it may post.
-    /// An exception out of a task is logged; the task is freed and the loop goes on.
+    /// Runs tasks until RequestStop(), then the accepted tasks and those that they post, then refuses and
+    /// returns. onIdle is called each time the queue has run empty, before sleeping or returning; it may
+    /// post. An exception of a task is logged; the task is freed and the loop continues.
     void Run(std::function<void()> const& onIdle);
-    /// From any thread, also before Run() or from inside a task. Run() returns at the first moment when nothing
-    /// is queued, so whoever posts without a pause keeps it from returning.
+    /// From any thread, also before Run() or from inside a task. Run() returns at the first moment when
+    /// nothing is queued, so whoever posts without a pause keeps it from returning.
     void RequestStop();
 
     /// Whether this thread runs the tasks.

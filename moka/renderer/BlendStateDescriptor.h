@@ -1,4 +1,4 @@
-/// BlendStateDescriptor: how a fragment and the pixel under it become the pixel, as a value.
+/// BlendStateDescriptor: how a fragment is combined with the pixel under it, as a value.
 /// A new one that is enabled replaces: the source counts once and the destination not at all.
 #pragma once
 

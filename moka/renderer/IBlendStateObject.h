@@ -1,5 +1,5 @@
-/// IBlendStateObject: a blend state that can be put in force.
-/// Owner:  whoever created it, until Release(), which keeps an applied state in force.
+/// IBlendStateObject: a blend state that can be applied.
+/// Owner:  the creator, until Release(), which leaves an applied state set.
 /// Thread: render thread.
 #pragma once
 

@@ -1,5 +1,5 @@
 /// IDepthStencilBuffer: one combined depth and stencil buffer, to be attached to a render target of its size.
-/// Owner:  whoever created it, until Release(). Release it after detaching; released while attached, it is
+/// Owner:  the creator, until Release(). Release it after detaching; released while attached, it is
 ///         detached first.
 /// Thread: render thread.
 #pragma once

@@ -1,9 +1,9 @@
 /// IParameterBinding: a handle on one uniform of a program: sets its value, knows its type.
-/// Owner:   whoever looked it up; deleting it is the release. It may outlive its program, and then does
+/// Owner:   the caller of GetParameter; deleting it is the release. It may outlive its program, and then does
 ///          nothing.
 /// Thread:  render thread.
-/// Types:   the handle converts from the type it reports: a bool is one byte, an int or a texture unit an int,
-///          a vector or a matrix its packed floats (matrices column-major).
+/// Types:   the handle converts from the type it reports: a bool is one byte, an int or a texture unit an
+///          int, a vector or a matrix its packed floats (matrices column-major).
 /// The vtable order is ABI: Set first, then the destructor.
 #pragma once
 

@@ -1,4 +1,4 @@
-/// IRendererDeviceCaps: the device's capabilities, read once when the render thread's context is made.
+/// IRendererDeviceCaps: the device's capabilities, read once when the context is attached.
 /// Thread: any, without GL. Before a context exists it answers with the minimum of OpenGL ES 3.0.
 /// The vtable order is ABI: the destructor, then GetMaxTextureSize.
 #pragma once

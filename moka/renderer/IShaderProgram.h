@@ -1,6 +1,6 @@
 /// IShaderProgram: a vertex and a fragment stage, compiled and linked. One whose sources do not compile is an
 /// object like any other: it can be current, its parameters are of unknown type, and it draws nothing.
-/// Owner:  whoever created it, until Release(). It outlives its context: made current in a later one, it is
+/// Owner:  the creator, until Release(). It outlives its context: made current in a later one, it is
 ///         compiled there, with the values and handles that it has.
 /// Thread: render thread.
 /// The vtable order is ABI.

@@ -1,5 +1,5 @@
 /// ITextureObject: an RGBA8 texture, or one of several views of the same storage.
-/// Owner:  whoever created it; deleting it is the release. Storage that is shared lives until the last view
+/// Owner:  the creator; deleting it is the release. Storage that is shared lives until the last view
 ///         goes.
 /// Thread: render thread. Deleting elsewhere is tolerated: the GL name is dropped when the render thread next
 ///         runs.
@@ -37,8 +37,8 @@ public:
     /// is refused with a log line.
     virtual void SetParameter(int id, int value) = 0;
 
-    /// Takes a copy of the bound render target: the smaller of both sizes, from its first row, without a flip.
-    /// A target without alpha reads as opaque; one over this texture's own storage changes nothing.
+    /// Takes a copy of the bound render target: the smaller of both sizes, from its first row, without a
+    /// flip. A target without alpha reads as opaque; one over this texture's own storage changes nothing.
     virtual void CopyFromRenderTarget() = 0;
 
     /// The size in texels.

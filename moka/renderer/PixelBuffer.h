@@ -1,4 +1,4 @@
-/// PixelBuffer.h: where the pixels of an upload come from and where those of a read-back go. RGBA8, four bytes
+/// PixelBuffer.h: source of an upload and destination of a read-back. RGBA8, four bytes
 /// a pixel, rows packed at rowLength pixels.
 #pragma once
 

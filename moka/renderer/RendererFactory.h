@@ -1,6 +1,6 @@
-/// RendererFactory: makes every GPU object. The implementation is chosen when linking; see README.md here.
+/// RendererFactory: creates all GPU objects. The implementation is chosen when linking; see README.md here.
 /// Thread: render thread, except where a line says otherwise. Debug builds check it.
-/// Fails:  null or false and one error line with the driver's text; never an exception.
+/// Fails:  null or false, and logs an error with the driver's text; never an exception.
 #pragma once
 
 #include "moka/base/Export.h"
@@ -42,11 +42,12 @@ using RendererProcLoader = void (*(*)(char const* name))();
 
 class MOKA_API RendererFactory {
 public:
-    /// Called by the owner of the context, on the render thread with the context current, once before anything
-    /// else and once after everything. Attach reads the device's capabilities and resets the statistics; false
-    /// (one error line) when the context is not OpenGL ES 3.0 or another one is attached. Without a loader
-    /// there are no driver messages and no object labels. Detach deletes pooled and orphaned GL names; objects
-    /// that are still alive become inert and may be released later; a program works again in the next context.
+    /// Called by the owner of the context, on the render thread with the context current, once before
+    /// anything else and once after everything. Attach reads the device's capabilities and resets the
+    /// statistics; false (and an error in the log) when the context is not OpenGL ES 3.0 or another one is
+    /// attached. Without a loader there are no driver messages and no object labels. Detach deletes pooled
+    /// and orphaned GL names; objects that are still alive become inert and may be released later; a program
+    /// works again in the next context.
     static bool AttachContext(RendererLimits const& limits = {}, RendererProcLoader loader = nullptr);
     static void DetachContext();
 
@@ -76,7 +77,7 @@ public:
     static IDepthStencilBuffer* CreateDepthStencilBuffer(int width, int height);
 
     /// GLSL ES 1.00 or 3.00. Attributes take locations 0, 1, ... in the order of their declaration. Never
-    /// null: sources that do not compile are reported with one error line, and the program then draws nothing.
+    /// null: if sources do not compile, an error is logged and the program draws nothing.
     /// The name appears in messages and GL debuggers; all texts are copied.
     static IShaderProgram* CreateShaderProgram(char const* vertexSource, char const* fragmentSource,
                                                char const* name);
@@ -94,8 +95,8 @@ public:
     /// Never null; not to be released.
     static IRasterizerState* GetRasterizerState();
 
-    /// While on, the current stencil test is a clip, which draws cannot switch off: applying a state without a
-    /// stencil test keeps it, and clearing the colour fills through it.
+    /// While on, the current stencil test is a clip, which draws cannot switch off: applying a state without
+    /// a stencil test keeps it, and clearing the colour fills through it.
     static void SetStencilClip(bool on);
 
     /// Off until switched on. Immediate: all requests between an activation and its deactivation reach GL at
@@ -106,9 +107,10 @@ public:
 
     /// Before external GL: submits all requests so far. The host's frame buffers, viewport,
     /// vertex array, culling, depth test and dither are as they were, pixel store holds GL's defaults, no
-    /// sampler is bound. The vertex and uniform buffers that the host had bound are bound again. Scissor, blend,
-    /// stencil and masks are as last set or applied here. Not given back: texture bindings, the program, and
-    /// uniform buffer binding point 23, which a host should not use. An active target stays the active one.
+    /// sampler is bound. The vertex and uniform buffers that the host had bound are bound again. Scissor,
+    /// blend, stencil and masks are as last set or applied here. Not restored: texture bindings, the program,
+    /// and uniform buffer binding point 23, which a host should not use. An active target stays the active
+    /// one.
     static void Flush();
     /// Before external GL that draws into the active target: submits all requests so far. Then the
     /// target is bound, and viewport, scissor, blend, stencil, masks, program and textures are as last set or

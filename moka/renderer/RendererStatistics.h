@@ -1,5 +1,6 @@
 /// RendererStatistics: the renderer's live objects, and counts of its work since the context was attached.
-/// Objects are counted by kind. If any but the pooled ones are left when a test ends, the test has found a leak.
+/// Objects are counted by kind. If any but the pooled ones are left when a test ends, the test has found a
+/// leak.
 #pragma once
 
 #include <array>
@@ -54,7 +55,7 @@ struct RendererStatistics {
     int textures = 0; ///< storages, not views
     /// Live objects by kind.
     int samplers = 0;
-    int frameBuffers = 0;  ///< made by us
+    int frameBuffers = 0;  ///< created by the renderer
     int renderBuffers = 0; ///< in use; pooled ones are counted apart
     int pooledRenderBuffers = 0;
     int renderTargets = 0; ///< objects of our interfaces
@@ -88,7 +89,7 @@ struct RendererStatistics {
     /// Work and bytes moved.
     std::uint64_t clears = 0;
     std::uint64_t copies = 0;
-    std::uint64_t mipmapUpdates = 0; ///< times that the levels of a texture were made
+    std::uint64_t mipmapUpdates = 0; ///< times that a texture's levels were generated
     std::uint64_t bytesUploaded = 0; ///< texels
     std::uint64_t vertexBytes = 0;
     std::uint64_t bytesReadBack = 0;

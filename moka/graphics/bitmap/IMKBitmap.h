@@ -1,8 +1,8 @@
 /// IMKBitmap: a GPU image that canvases draw into and drawables sample from.
-/// Owner:   reference counted; what a creating function returns carries one reference for its caller.
+/// Owner:   reference counted; a creating function returns one reference.
 /// Thread:  caller-side bitmaps from any thread, render-thread bitmaps on the render thread only. The tag is
 ///          not synchronised.
-/// What a bitmap can do is asked through the four capability getters, which return null for what it lacks;
+/// The four capability getters say what a bitmap can do: each returns null for a capability that it lacks;
 /// nobody casts.
 #pragma once
 
@@ -29,8 +29,8 @@ public:
     virtual void SetTag(char const* tag) = 0;
     virtual char const* GetTag() = 0;
 
-    /// A caller-side bitmap over the same image, holding one reference; of a screen bitmap, over the other of the
-    /// host's two frame buffers. Null without a queue and when memory runs out.
+    /// A caller-side bitmap over the same image, holding one reference; of a screen bitmap, over the other of
+    /// the host's two frame buffers. Null without a queue and when memory runs out.
     virtual IMKBitmap* Clone() = 0;
 
     /// The queue that it was created with; may be null.

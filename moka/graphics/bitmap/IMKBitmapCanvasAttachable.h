@@ -16,9 +16,9 @@ public:
     virtual void AttachToCanvasRT(bool release) = 0;
     virtual void DetachFromCanvasRT(bool release) = 0;
 
-    /// Whether drawing into a strip, or with -1 into the bitmap as one frame buffer, reaches the bitmap. It does
-    /// not where the frame buffer could not be created, or not yet; whoever draws regardless draws into
-    /// whatever the host has bound.
+    /// Whether drawing into a strip, or with -1 into the bitmap as one frame buffer, reaches the bitmap. It
+    /// does not where the frame buffer could not be created, or not yet; a draw would then go to the frame
+    /// buffer that the host has bound.
     virtual bool HasFrameBufferRT(int /*strip*/) { return true; }
 };
 

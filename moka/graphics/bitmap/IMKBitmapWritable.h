@@ -7,7 +7,7 @@
 
 namespace Moka {
 
-/// What a frame buffer's contents may be dropped of when it is deactivated: a set of two bits.
+/// Contents that may be discarded when a frame buffer is deactivated: a set of two bits.
 enum DiscardFramebufferType : int {
     DiscardFramebufferNone = 0,
     DiscardFramebufferColor = 1,

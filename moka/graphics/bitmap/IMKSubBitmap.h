@@ -18,7 +18,7 @@ class IMKSubBitmap : public IMKBitmapWritable,
                      public IMKBitmapBufferUpdatable,
                      public IMKBitmapDataGettable {
 public:
-    /// The band number: differs from the position in the list only for bitmaps made of a region.
+    /// The band number: differs from the position in the list only for bitmaps of a region.
     virtual int GetBitmapIndex() = 0;
     virtual int GetX() = 0;
     virtual int GetY() = 0;
@@ -26,7 +26,7 @@ public:
     virtual int GetHeight() = 0;
     virtual Rect GetBitmapRect() = 0;
 
-    /// Null until the render thread has made it, or when it could not.
+    /// Null until the render thread has created it, or if it could not.
     virtual ITextureObject* GetTexture() = 0;
 
     /// One reference on the frame buffer for each attached canvas.

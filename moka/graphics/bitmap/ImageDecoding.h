@@ -10,7 +10,7 @@ namespace Moka {
 class Bitmap;
 class String;
 
-/// What follows the last "." of path; the whole path when it has none. False when either is null.
+/// The part after the last "." of path; the whole path without one. False when either is null.
 MOKA_API bool GetExtensionByFile(String const* path, String* extension);
 
 /// Whether that is exactly extension; case matters. False when either is null.
@@ -25,7 +25,7 @@ MOKA_API void MKBitmapFactory_UseNativeDecoder();
 MOKA_API Bitmap* CreateBitmapJNI(String const* path, int width, int height);
 
 namespace detail {
-/// What CreateBitmapJNI hands on to; null until there is one.
+/// The decoder that CreateBitmapJNI calls; null until one is set.
 using JavaDecoder = Bitmap* (*)(String const* path, int width, int height);
 void SetJavaDecoder(JavaDecoder decoder);
 

@@ -4,7 +4,7 @@
 /// Owner:  as IMKCanvasBase. A bitmap or drawable that a call names stays alive until it is drawn.
 /// Thread: as IMKCanvasBase.
 /// Units:  pixels before the current matrix, which scales widths, anti-aliasing fringes and dashes too.
-/// Fails:  silently: nothing is drawn for shapes without extent, null sources, or when the queue refuses.
+/// Fails:  silently: nothing is drawn for empty shapes, null sources, or if the queue refuses.
 /// The vtable order is ABI.
 #pragma once
 
@@ -42,8 +42,8 @@ public:
     virtual void DrawCircle(float cx, float cy, float radius, MKPaint const* paint) = 0;
 
     /// Screen bitmaps cannot be sampled and are not drawn. Without src the source rectangle is (GetX(),
-    /// GetY()) to (GetWidth(), GetHeight()). It differs from the bitmap's own rectangle if the bitmap does not
-    /// lie at the origin.
+    /// GetY()) to (GetWidth(), GetHeight()). It differs from the bitmap's own rectangle if the bitmap does
+    /// not lie at the origin.
     virtual void DrawBitmap(IMKBitmap* bitmap, float x, float y, MKPaint const* paint) = 0;
     virtual void DrawBitmap(IMKBitmap* bitmap, RectF const& dst, MKPaint const* paint) = 0;
     virtual void DrawBitmap(IMKBitmap* bitmap, RectF const& src, RectF const& dst, MKPaint const* paint) = 0;

@@ -1,8 +1,8 @@
-/// IMKCanvasBase: the operations of every canvas: clearing, a matrix, clip rectangles, a save stack over both,
-/// a tag.
+/// IMKCanvasBase: the operations of every canvas: clearing, a matrix, clip rectangles, a save stack over
+/// both, a tag.
 /// Owner:  reference counted; a creating function returns one reference to its caller.
 /// Thread: a caller-side canvas from one thread at a time, a render-thread canvas on the render thread.
-/// Units:  pixels of the target, origin top left, y down; angles in degrees, positive turns +x towards +y.
+/// Units:  pixels of the target, origin top left, y down; angles in degrees, positive rotates +x towards +y.
 /// The vtable order is ABI.
 #pragma once
 
@@ -15,7 +15,7 @@ class IMKBitmap;
 
 class IMKCanvasBase {
 public:
-    /// Any number may come, named or not, here and for ClipOp.
+    /// Other numbers are allowed: Save then saves neither part. A ClipOp without a name combines nothing.
     enum SaveFlag : int { SaveAll = 0, SaveMatrix = 1, SaveClip = 2 };
 
     /// How a clip rectangle R changes the allowed area A.
@@ -37,7 +37,7 @@ public:
     virtual void ClearAll(int argb) = 0;
     virtual void ClearAll(float r, float g, float b, float a) = 0;
 
-    /// Returns the level to restore to; -1 restores the last one, a level that does not exist nothing.
+    /// Save returns a level. Restore(-1) restores the last level; unknown levels are ignored.
     virtual int Save(SaveFlag flag) = 0;
     virtual void Restore(int level) = 0;
 

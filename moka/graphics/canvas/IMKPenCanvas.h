@@ -24,8 +24,8 @@ public:
     /// From the current matrix's pixels to clip space.
     virtual Matrix4<float> GetCanvasMatrix() = 0;
 
-    /// Between the two, external code may call GL: all earlier requests have been drawn, colour writes are on,
-    /// and the clip is set. The bitmap counts as one frame buffer, whatever the index.
+    /// Between the two, external code may call GL: all earlier requests have been drawn, colour writes are
+    /// on, and the clip is set. The bitmap is one frame buffer; the index is ignored.
     virtual void EnableClipRT(int frameBuffer) = 0;
     virtual void DisableClipRT() = 0;
 };

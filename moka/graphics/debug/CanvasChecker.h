@@ -1,4 +1,4 @@
-/// CanvasChecker: what the checkers of plain and of pen canvases have in common; see Checker.
+/// CanvasChecker: the common part of the checkers of both kinds of canvas; see Checker.
 #pragma once
 
 #include "moka/graphics/canvas/IMKCanvasBase.h"

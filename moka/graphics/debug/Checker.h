@@ -1,15 +1,15 @@
-/// Checker: a stand-in for an object that counts the references going through it, so that a use after the last
-/// Unref is met here, and not in freed memory. A debugging aid: code that suspects such a use hands out the
-/// checker in the object's place; the library itself makes none.
+/// Checker: wraps an object and counts the references that go through it. A use after the last Unref fails
+/// here, and not in freed memory. A debugging aid: code that suspects such a use hands out the checker
+/// instead of the object; the library itself creates none.
 ///
 ///     MKBitmapChecker     Checker<IMKBitmap>
 ///     MKCanvasChecker     CanvasChecker<IMKCanvas>, over Checker<IMKCanvas>
 ///     MKPenCanvasChecker  CanvasChecker<IMKPenCanvas>, over Checker<IMKPenCanvas>
 ///
-/// Owner:  whoever made it deletes it. It holds none of the object's references, and stays alive at a count of
+/// Owner:  the creator deletes it. It holds none of the object's references, and stays alive at a count of
 ///         zero, to refuse. Its own count starts at one.
-/// Thread: the object's own rules. Counting is exact from any thread, but a use that races with the last Unref
-///         may still get through.
+/// Thread: the object's own rules. Counting is exact from any thread, but a use that races with the last
+///         Unref may still get through.
 /// Fails:  with a count of zero every operation leaves the object alone, logs its address and the tag, and
 ///         throws std::logic_error.
 #pragma once
@@ -50,7 +50,7 @@ public:
     /// Forwards while referenced.
     IGLMsgQueue* GetMsgQueue() override { return Checked().GetMsgQueue(); }
 
-    /// Forwarded with the lock left: the object may go with its last reference, and run anything.
+    /// Forwards without the lock: the last reference may delete the object and run other code.
     int Ref() override {
         ChangeCount(1);
         return mWrapped->Ref();

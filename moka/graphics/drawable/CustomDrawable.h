@@ -1,8 +1,8 @@
-/// CustomDrawable: the base of the custom drawables: the life of the GPU objects, which are made and released
-/// on the render thread while the drawable itself is made and dropped anywhere, and the bitmaps drawn.
-/// Owner:  reference counted; the creator holds the first reference, the task that makes the GPU objects one
-///         more. If a queue refuses that task, the drawable draws nothing and is never deleted; if it refuses
-///         a release, that object leaks.
+/// CustomDrawable: the base of the library's custom drawables. It creates and releases the GPU objects on the
+/// render thread, while the drawable itself lives on any thread, and holds the bitmaps to draw.
+/// Owner:  reference counted; the creator holds the first reference, the task that creates the GPU objects
+///         one more. If a queue refuses that task, the drawable draws nothing and is never deleted; if it
+///         refuses a release, that object leaks.
 /// Thread: construction, destruction and setters on the caller's thread, DrawRT on the render thread. Setters
 ///         are not synchronised. They also affect draws that are posted but not yet run.
 /// Fails:  silently: without GPU objects, or without a bitmap that can be sampled, DrawRT touches nothing.
@@ -43,8 +43,8 @@ protected:
     /// Whether all GPU objects could be created.
     bool IsConstructed() const;
 
-    /// Everything that comes before the uniforms. The caller sets all of them, the projection first, then ends
-    /// with DrawVertices.
+    /// Everything that comes before the uniforms. The caller sets all of them, the projection first, then
+    /// ends with DrawVertices.
     Shader& Begin(void const* vertices, int count, IMKBitmapReadable* tiled, MKPaint const& paint);
     /// Draws the vertices that Begin set.
     void DrawVertices();

@@ -12,7 +12,7 @@ class MKPaint;
 
 class IMKCustomDrawable {
 public:
-    /// Called once for each frame buffer of the target, which is active, with its clip in force. projection
+    /// Called once for each frame buffer of the target. It is active and its clip is set. projection
     /// maps the canvas's pixels to clip space.
     virtual void DrawRT(Matrix4<float> const& projection, MKPaint const& paint) = 0;
     virtual int Ref() = 0;

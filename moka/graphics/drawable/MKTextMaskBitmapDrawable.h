@@ -1,5 +1,5 @@
 /// MKTextMaskBitmapDrawable: the alpha of a bitmap, painted in the paint's colour; where the alpha is 0
-/// nothing is drawn, whatever the transfer mode. The colour's own alpha has no effect.
+/// nothing is drawn, in every transfer mode. The colour's own alpha has no effect.
 /// Units: the canvas's pixels.
 /// See CustomDrawable.h for ownership, threads and failures.
 #pragma once

@@ -1,5 +1,5 @@
 /// ShaderExceptions.h: a program and the code that sets its uniforms disagree: a mistake of the developer's,
-/// met when the shader is made, or when a parameter is set that was never bound.
+/// thrown when the shader is created, or when a parameter is set that was never bound.
 #pragma once
 
 #include "moka/base/Export.h"
@@ -11,7 +11,7 @@ namespace Moka {
 
 namespace detail {
 
-/// A message that needs no memory: a mistake is told in its own words also when that ran out. Cut at 127 bytes.
+/// A message that needs no memory: it is complete even without memory. Cut at 127 bytes.
 class ShaderMessage {
 public:
     /// Copies text.

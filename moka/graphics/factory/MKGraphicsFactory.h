@@ -1,11 +1,11 @@
-/// MKGraphicsFactory: the entry point. It makes every bitmap and canvas.
-/// Owner:  each result carries one reference for the caller, given back with ReleaseBitmap or ReleaseCanvas; a
+/// MKGraphicsFactory: the entry point. It creates bitmaps and canvases.
+/// Owner:  each result carries one reference for the caller, released with ReleaseBitmap or ReleaseCanvas; a
 ///         CPU bitmap is the caller's to delete.
-/// Thread: any; no state. useQueue chooses the flavour: not 0 makes caller-side objects, usable from any
-///         thread, whose work is posted to queue; 0 makes render-thread objects, to be made and used there
-///         only.
+/// Thread: any; no state. useQueue chooses the flavour: not 0 creates caller-side objects, usable from any
+///         thread, whose work is posted to queue; 0 creates render-thread objects, to be created and used
+///         there only.
 /// Units:  pixels; RGBA8, premultiplied.
-/// Fails:  null; an invalid request, and a file that cannot be decoded, log one error line.
+/// Fails:  null; an invalid request, and a file that cannot be decoded, log an error.
 ///
 /// Without a queue:
 ///     from pixels or a file, whole or a region   null, and the error line of an invalid size
@@ -13,7 +13,7 @@
 ///                                                null without a line, render-thread made
 ///     over a screen; canvas, pen canvas          caller-side null without a line, render-thread made
 ///     from a texture                             made: without strips it never posts
-/// What is made without a queue has no clone, since clones are caller-side; and a canvas without one cannot
+/// A bitmap created without a queue has no clone, since clones are caller-side. A canvas without one cannot
 /// darken or lighten bitmaps.
 #pragma once
 
@@ -52,7 +52,7 @@ public:
     static IMKBitmap* CreateBitmap(IGLMsgQueue* queue, String const* path, int width, int height,
                                    int useQueue);
 
-    /// The part of a file's image that region covers; decoded by the base library whatever the extension.
+    /// The part of a file's image that region covers; decoded by the base library for every extension.
     static IMKBitmap* CreateBitmap(IGLMsgQueue* queue, Rect const& region, String const* path, int useQueue);
 
     /// An empty bitmap of size zero; null when texture is.
@@ -70,8 +70,8 @@ public:
     static void RefBitmap(IMKBitmap* bitmap);
     static void ReleaseBitmap(IMKBitmap* bitmap);
 
-    /// Null, without a message, when target is null. A pen canvas needs a texture bitmap; on another one it is
-    /// made, with one error line, and draws nothing.
+    /// Null, without a message, when target is null. A pen canvas needs a texture bitmap; on another one it
+    /// is created, logs an error, and draws nothing.
     static IMKCanvas* CreateCanvas(IGLMsgQueue* queue, IMKBitmap* target, int useQueue);
     static IMKPenCanvas* CreatePenCanvas(IGLMsgQueue* queue, IMKBitmap* target, int useQueue);
 

@@ -1,5 +1,5 @@
 /// Display: the record behind a Java MokaDisplay, whose handle is this object's address.
-/// Owner:  whoever made it; a Java MokaDisplay owns the one it made.
+/// Owner:  the creator; a Java MokaDisplay owns the one that it created.
 /// Thread: not synchronised.
 #pragma once
 

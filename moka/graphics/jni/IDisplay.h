@@ -6,7 +6,7 @@ namespace Moka {
 
 class IDisplay {
 public:
-    /// Java's numbers, handed on as they come; what each one means is Java's business.
+    /// Numbers from Java, unchanged; Java defines their meaning.
     enum class LayoutDirection : int {};
     enum class Orientation : int {};
     enum class ScreenOrientation : int {};

@@ -1,10 +1,10 @@
-/// BitmapLoaderInterface: whom the loader tells about loads and saves.
-/// Owner:  whoever implements it; the loader keeps a plain pointer until the request is over.
+/// BitmapLoaderInterface: receives the results of loads and saves.
+/// Owner:  the implementer; the loader keeps a plain pointer until the request is over.
 /// Thread: everything is called on the loader's thread. OnCallbackPending comes first, inside the loader's
-///         lock: it must not wait for anything that another thread does with the loader. Then one result, then
-///         OnCallbackCompleted, both with no lock held. After OnCallbackCompleted nothing touches the
+///         lock: it must not wait for anything that another thread does with the loader. Then one result,
+///         then OnCallbackCompleted, both with no lock held. After OnCallbackCompleted nothing touches the
 ///         listener.
-/// Fails:  an exception out of an operation is one error line; the rest of the sequence still comes.
+/// Fails:  an exception of an operation is logged as an error; the rest of the sequence is still called.
 #pragma once
 
 #include "moka/base/Export.h"

@@ -1,4 +1,4 @@
-/// LoaderFrontEnd: what MKBitmapLoader and BitmapLoader have in common. A front end asks for loads and saves
+/// LoaderFrontEnd: the common part of MKBitmapLoader and BitmapLoader. A front end asks for loads and saves
 /// under numbers of the caller's choice and hands the results to the functions it was given.
 /// Owner:   the caller; any number of them, all served by the one loader of the process, in the order of the
 ///          requests.
@@ -7,8 +7,8 @@
 ///          destroy the front end that is calling.
 /// Loop:    start it once in a process, by one of the two ways, which are alternatives. Requests made before
 ///          wait for it.
-/// Results: each request that was accepted, and not cancelled, calls back once. An exception out of a function
-///          is one error line.
+/// Results: each request that was accepted, and not cancelled, calls back once. An exception out of a
+///          function is one error line.
 /// Units:   sizes in pixels; RGBA8, premultiplied.
 /// Fails:   a refused request is false and calls nobody; a file that cannot be read or written is onLoadError
 ///          or onSaveError.
@@ -46,13 +46,14 @@ public:
         std::function<void(int id, String const& path, void* userData)> onSaveError;
     };
 
-    /// False while a load of this id is waiting or being decoded, and when memory runs out. Without a size, or
-    /// when one side is 0, the file's own. queue is where the result goes.
+    /// False while a load of this id is waiting or being decoded, and when memory runs out. Without a size,
+    /// or when one side is 0, the file's own. queue is where the result goes.
     bool RequestLoad(int id, String const& path, IGLMsgQueue* queue);
     bool RequestLoad(int id, String const& path, IGLMsgQueue* queue, int width, int height);
 
-    /// A load that waits or is being decoded never calls back; its id is free again. One whose OnCallbackPending
-    /// was called still calls back: after a cancel, WaitForCallback() returns when that is over.
+    /// A load that waits or is being decoded never calls back; its id is free again. One whose
+    /// OnCallbackPending was called still calls back: after a cancel, WaitForCallback() returns when that is
+    /// over.
     void CancelLoadRequest(int id);
     void CancelAllLoadRequest();
 
@@ -64,7 +65,7 @@ public:
 
     /// Makes the calling thread the loader's.
     [[noreturn]] static void startEventLoop();
-    /// Starts a thread of the loader's own; again, it only says true. False when there is none to be had.
+    /// Starts the loader's own thread; further calls return true. False if the system has no more threads.
     static bool startEventLoopBySelf();
 
     /// Returns when no load is being processed.
@@ -92,8 +93,8 @@ protected:
     LoaderFrontEnd(char const* name, Callback* callback);
     ~LoaderFrontEnd() override = default;
 
-    /// First in the destructor of the class that is called back: drops the loads, lets the saves go on without
-    /// it, and waits for a function that is running.
+    /// First in the destructor of the class that is called back: drops the loads, lets the saves go on
+    /// without it, and waits for a function that is running.
     void Detach();
 
     /// Logs and returns what became of a save; source is the bitmap, or the buffer.

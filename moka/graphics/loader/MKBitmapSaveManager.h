@@ -1,11 +1,12 @@
 /// MKBitmapSaveManager: saves GPU bitmaps to files, counts the saves in flight, and hands each result to the
-/// thread that made the manager, or to a thread that waits for it.
-/// Owner:   the caller. Make it on a thread with a MessageLoop; without one, results come only to those who
+/// thread that created the manager, or to a thread that waits for it.
+/// Owner:   the caller. Create it on a thread with a MessageLoop; without one, results come only to those who
 ///          wait.
-/// Thread:  requests, waits and the count from any. Results are handed over on the message loop's thread or on
-///          a waiting one, one at a time, with the manager's lock held: they may request further saves, but
-///          neither wait for the manager nor destroy it.
-/// Destroy: from any thread. Saves in flight still write their files; results not yet handed over are dropped.
+/// Thread:  requests, waits and the count from any. Results are handed over on the message loop's thread or
+///          on a waiting one, one at a time, with the manager's lock held: they may request further saves,
+///          but neither wait for the manager nor destroy it.
+/// Destroy: from any thread. Saves in flight still write their files; results not yet handed over are
+///          dropped.
 /// Fails:   see RequestSave. The event loop of the loader must be running
 ///          (MKBitmapLoader::startEventLoopBySelf).
 #pragma once
@@ -31,7 +32,7 @@ class MOKA_API MKBitmapSaveManager : NonAssignable {
 public:
     /// Copied with each request. Either function may be null.
     struct SaveCallback {
-        /// What became of the save; context and userData are passed on.
+        /// The results of a save; context and userData are passed to both.
         void (*onSaveSucceeded)(void* context, String const* path, void* userData) = nullptr;
         void (*onSaveFailed)(void* context, String const* path, void* userData) = nullptr;
         void* context = nullptr;
@@ -41,9 +42,9 @@ public:
     MKBitmapSaveManager();
     virtual ~MKBitmapSaveManager();
 
-    /// callback may be null; the save counts all the same. False for an empty bitmap and when memory runs out;
-    /// a refused request stays counted, and waiting for the manager then never ends. So does a save whose
-    /// read-back the bitmap's queue refuses.
+    /// callback may be null; the save counts all the same. False for an empty bitmap and when memory runs
+    /// out; a refused request stays counted, and waiting for the manager then never ends. So does a save
+    /// whose read-back the bitmap's queue refuses.
     bool RequestSave(int id, String const& path, IMKBitmap& bitmap, SaveCallback* callback,
                      int quality) const;
 

@@ -1,4 +1,4 @@
-/// Matrix4: a 4x4 transform: projections, and what reaches the shaders. A value: sixteen numbers.
+/// Matrix4: a 4x4 transform: projections, and the matrices of shaders. A value: sixteen numbers.
 /// Layout:  column-major; the element at row r, column c is storage element c * 4 + r. Below, m0 ... m15 are
 ///          storage elements; m12, m13, m14 hold the translation.
 /// Points:  columns, mapped as M * p.
@@ -87,7 +87,7 @@ public:
     Matrix4 rotation() const;    ///< without the translation; m15 is kept
     Matrix4 translation() const; ///< the identity with this translation
 
-    /// The Euler rotation with this translation: what else this holds is discarded, not composed.
+    /// The Euler rotation with this translation: the rest of this matrix is discarded, not composed.
     Matrix4 rotate(T ax, T ay, T az) const;
     /// Overwrites the upper left 3x3 only. Unlike rotate() it keeps m3, m7, m11 and m15.
     ///

@@ -2,7 +2,7 @@
 /// A value: copied member by member, holds no resources. A draw call takes its own copy.
 /// Thread: one at a time, like any value.
 /// Units:  colour components 0 ... 1, not premultiplied; lengths in pixels. Nothing is checked: every setter
-///         stores what it is given.
+///         stores its argument.
 /// A new paint is opaque white, source-over, filled, one pixel wide, not anti-aliased and not dashed.
 #pragma once
 
@@ -13,7 +13,7 @@ namespace Moka {
 
 class MOKA_API MKPaint {
 public:
-    /// How source and destination become the pixel. The numbers of all four enumerations are the interface.
+    /// How source and destination are combined. The numbers of all four enumerations are ABI.
     enum XFermode : int {
         Add = 0,
         Clear = 1,
@@ -31,8 +31,8 @@ public:
         SrcKeepDstAlpha = 13,
         SrcNonPremultiplied = 14,
         SrcOverNonPremultiplied = 15,
-        Darken = 16,  ///< of bitmaps; anything else is drawn as with Src
-        Lighten = 17, ///< of bitmaps; anything else is drawn as with Src
+        Darken = 16,  ///< for bitmaps; other shapes as Src
+        Lighten = 17, ///< for bitmaps; other shapes as Src
         BlendingOff = 18,
     };
 
@@ -43,10 +43,10 @@ public:
     enum LineCapType : int {
         Butt = 0,   ///< the line ends at its end point
         Round = 1,  ///< half a disc around the end point
-        Square = 2, ///< extended by half the width; also what any other number means
+        Square = 2, ///< extended by half the width; any other number means this
     };
 
-    /// How a texture goes on outside itself. Default is Clamp.
+    /// The content outside a texture. Default is Clamp.
     enum TileMode : int { Default = 0, Clamp = 1, Mirror = 2, Repeat = 3 };
 
     MKPaint() = default;
@@ -61,7 +61,7 @@ public:
     void SetColor(float r, float g, float b, float a) { mColor = {r, g, b, a}; }
     Vector4<float> GetColor() const { return mColor; }
 
-    /// Replaces the colours of what is drawn; its shape and alpha stay.
+    /// The tint replaces the colours of a bitmap or shape and keeps its alpha.
     void SetTintColor(int argb);
     void SetTintColor(float r, float g, float b, float a);
     Vector4<float> GetTintColor() const { return mTintColor; }
@@ -88,8 +88,8 @@ public:
     void SetAntiAliasing(bool on) { mAntiAliasing = on; }
     bool IsAntiAliasing() const { return mAntiAliasing; }
 
-    /// Lengths of a dash, a gap, a dash, a gap, repeated along the line; two stand for four. A first length
-    /// that is not greater than -1 means no dashes.
+    /// Lengths of a dash, a gap, a dash, a gap, repeated along the line; two numbers are used twice. A first
+    /// length that is not greater than -1 means no dashes.
     void SetDashedLinePattern(Vector2<float> const& pattern) {
         mDashedLinePattern = {pattern.x, pattern.y, pattern.x, pattern.y};
     }
