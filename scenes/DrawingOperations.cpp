@@ -7,11 +7,6 @@ namespace {
 
 using Kind = SceneValue::Kind;
 
-MKPaint GetPaint(SceneFields& fields, SceneNames const& names) {
-    SceneValue const* const value = fields.Find("paint");
-    return value ? ReadPaint(*value, names.paints) : MKPaint();
-}
-
 SceneOperation ReadDrawLine(SceneFields& fields, SceneNames const& names) {
     return {[from = fields.GetPoint("from"), to = fields.GetPoint("to"), paint = GetPaint(fields, names)](
                 IMKCanvas& canvas, SceneBitmaps const&) { canvas.DrawLine(from, to, &paint); }};
@@ -110,15 +105,6 @@ SceneOperation ReadDrawStroke(SceneFields& fields, SceneNames const& names) {
             count, true};
 }
 
-std::size_t GetBitmap(SceneFields& fields, SceneNames const& names) {
-    SceneValue const& value = fields.Get("bitmap");
-    auto const found = names.bitmaps.find(ReadText(value));
-    if (found != names.bitmaps.end()) return found->second;
-    std::string known;
-    for (auto const& entry : names.bitmaps) known += (known.empty() ? "" : ", ") + entry.first;
-    ThrowExpected(value, known.empty() ? "described under \"bitmaps\"" : "one of " + known);
-}
-
 SceneOperation ReadDrawBitmap(SceneFields& fields, SceneNames const& names) {
     std::size_t const bitmap = GetBitmap(fields, names);
     MKPaint const paint = GetPaint(fields, names);
@@ -167,6 +153,20 @@ SceneOperation ReadDrawBitmaps(SceneFields& fields, SceneNames const& names) {
 }
 
 } // namespace
+
+MKPaint GetPaint(SceneFields& fields, SceneNames const& names) {
+    SceneValue const* const value = fields.Find("paint");
+    return value ? ReadPaint(*value, names.paints) : MKPaint();
+}
+
+std::size_t GetBitmap(SceneFields& fields, SceneNames const& names, char const* key) {
+    SceneValue const& value = fields.Get(key);
+    auto const found = names.bitmaps.find(ReadText(value));
+    if (found != names.bitmaps.end()) return found->second;
+    std::string known;
+    for (auto const& entry : names.bitmaps) known += (known.empty() ? "" : ", ") + entry.first;
+    ThrowExpected(value, known.empty() ? "described under \"bitmaps\"" : "one of " + known);
+}
 
 SceneOperationTable const& GetDrawingOperations() {
     static SceneOperationTable const kTable{

@@ -25,9 +25,6 @@ using Kind = SceneValue::Kind;
 
 constexpr int kMaxSide = BitmapFactory::kMaxSide;
 constexpr int kMaxPictureSide = 4096;
-constexpr std::size_t kMaxBitmaps = 64;
-constexpr std::int64_t kMaxPicturePixels = std::int64_t{64} << 20; // 256 MiB
-constexpr std::uintmax_t kMaxFileBytes = 16u << 20;
 
 struct ScenePicture {
     Picture picture;
@@ -52,7 +49,7 @@ struct Content {
         steps.Play(canvas, bitmaps);
     }
 
-    // No two drivers filter mipmaps alike.
+    // No two drivers filter mipmaps alike, and custom drawables have programs.
     bool NeedsGpu() const {
         return steps.needsGpu || std::any_of(pictures.begin(), pictures.end(), [](ScenePicture const& one) {
                    return one.filter != TextureFilterLinear;

@@ -5,10 +5,17 @@
 
 #include "scenes/Scene.h"
 
+#include <cstddef>
+#include <cstdint>
 #include <string>
 #include <string_view>
 
 namespace Moka::Scenes {
+
+// Files and pictures made by rule alike.
+constexpr std::size_t kMaxBitmaps = 1024;
+constexpr std::int64_t kMaxPicturePixels = std::int64_t{64} << 20; // together; 256 MiB
+constexpr std::size_t kMaxFileBytes = 16u << 20;
 
 // The scene's name is the file's, without folder and extension. "-" is standard input; images then lie relative
 // to the current folder.

@@ -89,6 +89,16 @@ void ReadTileMode(SceneFields& fields, MKPaint& paint) {
         paint.SetTileMode(read(*value));
 }
 
+std::string ToText(int number, std::vector<std::string> const& names) {
+    bool const hasName = number >= 0 && static_cast<std::size_t>(number) < names.size();
+    return hasName ? Quote(names[static_cast<std::size_t>(number)]) : std::to_string(number);
+}
+
+void AddNumbered(SceneLine& line, char const* key, int number, int plain,
+                 std::vector<std::string> const& names) {
+    if (number != plain) line.AddRaw(key, ToText(number, names));
+}
+
 } // namespace
 
 MKPaint ReadPaint(SceneValue const& value, NamedPaints const& named) {
@@ -102,6 +112,27 @@ MKPaint ReadPaint(SceneValue const& value, NamedPaints const& named) {
     ReadTileMode(fields, paint);
     fields.CheckAll();
     return paint;
+}
+
+SceneLine DescribePaint(MKPaint const& paint) {
+    SceneLine line("paint");
+    MKPaint const plain;
+    auto const same = [](Vector4<float> const& a, Vector4<float> const& b) {
+        return a.x == b.x && a.y == b.y && a.z == b.z && a.w == b.w;
+    };
+    if (!same(paint.GetColor(), plain.GetColor())) line.Add("color", paint.GetColor());
+    if (paint.HasTintColor()) line.Add("tintColor", paint.GetTintColor());
+    AddNumbered(line, "xfermode", paint.GetXFermode(), plain.GetXFermode(), kXFermodes);
+    AddNumbered(line, "style", paint.GetStyle(), plain.GetStyle(), kStyles);
+    if (paint.GetLineWidth() != plain.GetLineWidth()) line.Add("lineWidth", paint.GetLineWidth());
+    if (paint.IsAntiAliasing()) line.Add("antiAliasing", true);
+    if (!same(paint.GetDashedLinePattern(), plain.GetDashedLinePattern()))
+        line.Add("dashedLinePattern", paint.GetDashedLinePattern());
+    AddNumbered(line, "lineCapType", paint.GetLineCapType(), plain.GetLineCapType(), kCaps);
+    if (paint.GetTileModeX() != plain.GetTileModeX() || paint.GetTileModeY() != plain.GetTileModeY())
+        line.AddRaw("tileMode", '[' + ToText(paint.GetTileModeX(), kTileModes) + ", " +
+                                    ToText(paint.GetTileModeY(), kTileModes) + ']');
+    return line;
 }
 
 } // namespace Moka::Scenes

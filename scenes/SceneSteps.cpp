@@ -95,7 +95,8 @@ SceneOperation ReadGroup(SceneFields& fields, SceneNames const& names) {
 
 SceneOperationReader FindReader(std::string const& name) {
     if (name == "Group") return ReadGroup;
-    for (SceneOperationTable const* const table : {&GetDrawingOperations(), &GetStateOperations()}) {
+    for (SceneOperationTable const* const table :
+         {&GetDrawingOperations(), &GetDrawableOperations(), &GetStateOperations()}) {
         auto const found = table->find(name);
         if (found != table->end()) return found->second;
     }
@@ -104,7 +105,8 @@ SceneOperationReader FindReader(std::string const& name) {
 
 std::string ListOperations() {
     std::string names = "Group";
-    for (SceneOperationTable const* const table : {&GetDrawingOperations(), &GetStateOperations()})
+    for (SceneOperationTable const* const table :
+         {&GetDrawingOperations(), &GetDrawableOperations(), &GetStateOperations()})
         for (auto const& entry : *table) names += ", " + entry.first;
     return names;
 }

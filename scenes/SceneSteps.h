@@ -51,9 +51,15 @@ struct SceneOperation {
 using SceneOperationReader = SceneOperation (*)(SceneFields&, SceneNames const&);
 using SceneOperationTable = std::map<std::string, SceneOperationReader>;
 
-// By the names that the canvas gives them: what draws; what clears, clips, saves or sets the matrix.
+// By the names that the canvas gives them: what draws; what clears, clips, saves or sets the matrix. By names of
+// their own: custom drawables of the library, and what a recording could not say.
 SceneOperationTable const& GetDrawingOperations();
+SceneOperationTable const& GetDrawableOperations();
 SceneOperationTable const& GetStateOperations();
+
+// Of the field "paint", a new one without it; of the field key, which names a bitmap.
+MKPaint GetPaint(SceneFields& fields, SceneNames const& names);
+std::size_t GetBitmap(SceneFields& fields, SceneNames const& names, char const* key = "bitmap");
 
 // value is a list of operations, groups among them.
 SceneSteps ReadSteps(SceneValue const& value, SceneNames const& names);

@@ -140,7 +140,7 @@ void Decode(benchmark::State& state, Picture picture, char const* extension, int
     Report(state, path);
 }
 
-void DecodeProfiled(benchmark::State& state, char const* extension, Moka::Testing::ProfileKind kind) {
+void DecodeProfiled(benchmark::State& state, char const* extension, char const* profile) {
     std::string const path = PathFor(kPhoto, extension, 100);
     String const text(path);
     BitmapFactory::SaveBitmap(&GetBitmap(kPhoto), &text, 100);
@@ -148,7 +148,7 @@ void DecodeProfiled(benchmark::State& state, char const* extension, Moka::Testin
     Moka::Testing::FileBytes const bytes(std::istreambuf_iterator<char>(plain), {});
     std::string const name = path + ".profiled";
     Moka::Testing::FileBytes const file =
-        Moka::Testing::EmbedProfile(bytes, Moka::Testing::MakeProfile(kind));
+        Moka::Testing::EmbedProfile(bytes, Moka::Testing::ReadProfile(profile));
     std::ofstream(name, std::ios::binary)
         .write(reinterpret_cast<char const*>(file.data()), static_cast<std::streamsize>(file.size()));
     String const profiled(name);
@@ -181,15 +181,14 @@ int RegisterAll() {
             add("DecodeTo1500", Decode, 1500);
         }
     }
-    using Moka::Testing::ProfileKind;
     for (char const* const extension : {"png", "jpg", "webp"}) {
-        auto const add = [&](char const* name, ProfileKind kind) {
+        auto const add = [&](char const* name, char const* profile) {
             benchmark::RegisterBenchmark((name + std::string("/photo/") + extension + "100").c_str(),
-                                         DecodeProfiled, extension, kind)
+                                         DecodeProfiled, extension, profile)
                 ->Unit(benchmark::kMillisecond);
         };
-        add("DecodeSrgb", ProfileKind::Srgb);
-        add("DecodeP3", ProfileKind::DisplayP3);
+        add("DecodeSrgb", "srgb");
+        add("DecodeP3", "p3");
     }
     return 0;
 }

@@ -16,6 +16,7 @@
 #include "moka/graphics/bitmap/IMKSubBitmap.h"
 #include "moka/graphics/bitmap/IMKTextureBitmap.h"
 #include "moka/graphics/bitmap/ImageDecoding.h"
+#include "moka/graphics/bitmap/TextureFilter.h"
 #include "moka/graphics/canvas/IMKCanvas.h"
 #include "moka/graphics/canvas/IMKCanvasBase.h"
 #include "moka/graphics/canvas/IMKPenCanvas.h"

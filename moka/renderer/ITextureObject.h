@@ -44,6 +44,9 @@ public:
     /// The size in texels.
     virtual int GetWidth() const = 0;
     virtual int GetHeight() const = 0;
+
+    // Its value for this view; -1 for an unknown one.
+    virtual int GetParameter(int id) const = 0;
 };
 
 } // namespace Moka

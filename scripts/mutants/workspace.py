@@ -19,12 +19,10 @@ WATCHED = ("CMakeLists.txt", "CMakePresets.json", "apps", "cmake", "java", "moka
 # Entries of CTest that are no GoogleTest program of their name, by the beginning of theirs: the folder that has them
 # (CTest looks through the others for nothing), and what they need built.
 ENTRIES = {
-    "moka_java": ("tests/jvm", ("moka_jvm_host", "moka_jvm_test_programs", "moka_jvm_test_no_natives",
-                                "moka_jvm_test_no_constructor", "moka_graphics")),
+    "moka_java": ("tests/jvm", ("moka_jvm_host", "moka_jvm_test_programs", "moka_graphics")),
     "moka_drawable_shaders": ("tests/unit/drawable", ()),
     "moka_pixel_window_tests": ("tests/pixel/host", ("moka_pixel_window_tests",)),
     "moka_soak_gles": ("tests/trust", ("moka_soak_gles",)),
-    "moka_soak_tracing": ("tests/trust", ("moka_soak_tracing",)),
     "readme.Draw": ("tests/readme", ("moka_readme", "moka")),
 }
 ANGLE = "angle:"  # before a program's name: on the second driver, as scripts/fetch-angle has brought it

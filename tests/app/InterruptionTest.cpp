@@ -125,11 +125,6 @@ protected:
     }
 };
 
-TEST_F(TerminalTest, ShowsWhatIsBeingDone) {
-    ExpectShows("encode, [1-9][0-9]*\\.[0-9] s", {"convert", "in.mki", "out.webp"},
-                [this] { return HasTemporary(); });
-}
-
 TEST_F(TerminalTest, ShowsHowManyOfManyAreDone) {
     for (char const* const name : {"a.png", "b.png", "c.png"}) Save(MakeNoise(100), name);
     std::filesystem::create_directory(mFolder / "out");

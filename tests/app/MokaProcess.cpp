@@ -21,8 +21,8 @@ int MakeCapture(char const* name) { return memfd_create(name, MFD_CLOEXEC); }
 std::string ReadAll(int file) {
     std::string text;
     char block[4096];
-    lseek(file, 0, SEEK_SET);
-    for (ssize_t got = 0; (got = read(file, block, sizeof(block))) > 0;)
+    // The place in the file is the process's own.
+    for (ssize_t got = 0; (got = pread(file, block, sizeof(block), static_cast<off_t>(text.size()))) > 0;)
         text.append(block, static_cast<std::size_t>(got));
     return text;
 }
@@ -67,13 +67,21 @@ void MokaProcess::RunChild(std::vector<std::string> const& arguments, ProcessOpt
         rlimit const both{limit, limit};
         setrlimit(RLIMIT_FSIZE, &both);
     }
-    execv(MOKA_EXECUTABLE, argv.data());
+    execv(options.program.c_str(), argv.data());
     _exit(127);
 }
 
 void MokaProcess::Signal(int signal) const {
     if (mPid > 0) kill(mPid, signal); // -1 would reach every process
 }
+
+bool MokaProcess::IsOver() const {
+    siginfo_t info{};
+    return waitid(P_PID, static_cast<id_t>(mPid), &info, WEXITED | WNOHANG | WNOWAIT) != 0 ||
+           info.si_pid != 0;
+}
+
+std::string MokaProcess::GetError() const { return ReadAll(mErr); }
 
 ProcessResult MokaProcess::Wait() {
     ProcessResult result;

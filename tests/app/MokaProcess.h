@@ -1,4 +1,4 @@
-// MokaProcess.h: runs the command-line tool as a person does, in a folder of its own.
+// MokaProcess.h: runs the command-line tool, or another program, as a person does, in a folder of its own.
 #pragma once
 
 #include <string>
@@ -17,6 +17,7 @@ struct ProcessResult {
 };
 
 struct ProcessOptions {
+    std::string program = MOKA_EXECUTABLE;
     std::vector<std::string> environment; // "NAME=value", beside what the test has
     long fileSizeLimit = 0;               // bytes; 0 for none
     int terminal = -1;                    // a terminal to use as stderr; err then stays empty
@@ -34,6 +35,9 @@ public:
     MokaProcess& operator=(MokaProcess const&) = delete;
 
     void Signal(int signal) const;
+    bool IsOver() const;
+    // What it has written to stderr so far.
+    std::string GetError() const;
     ProcessResult Wait();
 
 private:

@@ -3,6 +3,7 @@
 #include "examples/Picture.h"
 #include "moka/base/RefPtr.h"
 #include "moka/host/RenderThread.h"
+#include "tests/app/MokaProcess.h"
 #include "tests/examples/ExampleWindow.h"
 #include "tests/support/ImageCompare.h"
 #include "tests/support/TestFiles.h"
@@ -11,68 +12,14 @@
 
 #include <chrono>
 #include <cstdio>
-#include <cstdlib>
 #include <filesystem>
-#include <fstream>
-#include <iterator>
 #include <string>
 #include <thread>
-
-#include <fcntl.h>
-#include <sys/wait.h>
-#include <unistd.h>
 
 namespace Moka::Testing {
 namespace {
 
 std::string theProgram;
-
-// The example, with its messages in a file. Killed at the end of the scope.
-class Program {
-public:
-    Program() : mMessages(theProgram + ".log"), mProcess(fork()) {
-        if (mProcess == 0) Become();
-    }
-    ~Program() {
-        if (mProcess <= 0) return;
-        kill(mProcess, SIGKILL);
-        waitpid(mProcess, nullptr, 0);
-    }
-    Program(Program const&) = delete;
-    Program& operator=(Program const&) = delete;
-
-    // The exit status once it has ended; -1 before, and when a signal ended it.
-    int GetStatus() {
-        int status = 0;
-        if (mProcess <= 0 || waitpid(mProcess, &status, WNOHANG) != mProcess) return mStatus;
-        mProcess = 0;
-        return mStatus = WIFEXITED(status) ? WEXITSTATUS(status) : -1;
-    }
-    bool IsOver() {
-        GetStatus();
-        return mProcess <= 0;
-    }
-    std::string GetMessages() const {
-        std::ifstream file(mMessages);
-        return {std::istreambuf_iterator<char>(file), {}};
-    }
-
-private:
-    [[noreturn]] void Become() const {
-        int const log = open(mMessages.c_str(), O_WRONLY | O_CREAT | O_TRUNC, 0666);
-        dup2(log, STDERR_FILENO);
-        setenv("GDK_BACKEND", "x11", 1);
-        setenv("SDL_VIDEODRIVER", "x11", 1);
-        setenv("QT_QPA_PLATFORM", "xcb", 1);
-        setenv("QT_XCB_GL_INTEGRATION", "xcb_egl", 1);
-        execl(theProgram.c_str(), theProgram.c_str(), nullptr);
-        _exit(127);
-    }
-
-    std::string const mMessages;
-    pid_t mProcess; // 0 once it has ended
-    int mStatus = -1;
-};
 
 Picture DrawWithoutWindow(int width, int height) {
     Picture image(width, height);
@@ -106,12 +53,16 @@ bool IsSame(Picture const& a, Picture const& b) {
 }
 
 TEST(ExampleTest, ShowsThePictureAtEverySizeAndCloses) {
-    Program program;
+    ProcessOptions options;
+    options.program = theProgram;
+    options.environment = {"GDK_BACKEND=x11", "SDL_VIDEODRIVER=x11", "QT_QPA_PLATFORM=xcb",
+                           "QT_XCB_GL_INTEGRATION=xcb_egl"};
+    MokaProcess program(".", {}, options);
     ExampleWindow window;
     bool const isThere = Soon([&] { return program.IsOver() || window.Find(320, 240); }) && !program.IsOver();
-    std::string const messages = program.GetMessages();
+    std::string const messages = program.GetError();
     if (messages.find("no GLES context") != std::string::npos) GTEST_SKIP() << messages;
-    ASSERT_TRUE(isThere) << "status " << program.GetStatus() << ", " << messages;
+    ASSERT_TRUE(isThere) << messages;
     struct Size {
         int width;
         int height;
@@ -131,8 +82,9 @@ TEST(ExampleTest, ShowsThePictureAtEverySizeAndCloses) {
     }
     window.Close();
     EXPECT_TRUE(Soon([&] { return program.IsOver(); }));
-    EXPECT_EQ(program.GetStatus(), 0) << program.GetMessages();
-    EXPECT_EQ(program.GetMessages().find("mok_log"), std::string::npos) << program.GetMessages();
+    ProcessResult const result = program.Wait();
+    EXPECT_EQ(result.status, 0) << result.err;
+    EXPECT_EQ(result.err.find("mok_log"), std::string::npos) << result.err;
 }
 
 } // namespace

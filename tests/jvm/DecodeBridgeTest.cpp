@@ -30,28 +30,10 @@ constexpr char const* kBitmapType = "Landroid/graphics/Bitmap;";
 constexpr char const* kStringType = "Ljava/lang/String;";
 constexpr char const* kNotLoaded = "MKBitmapFactory : gDecodeFile Not loaded";
 
-// What a lookup by name is not to find, however the class path looks.
-std::string hidden;
-JNINativeInterface_ const* original;
-
-char const* Hide(char const* name) { return hidden == name ? "isNotThere" : name; }
-jclass JNICALL FindClass(JNIEnv* env, char const* name) { return original->FindClass(env, Hide(name)); }
-jmethodID JNICALL GetStaticMethodID(JNIEnv* env, jclass type, char const* name, char const* signature) {
-    return original->GetStaticMethodID(env, type, Hide(name), signature);
-}
-jmethodID JNICALL GetMethodID(JNIEnv* env, jclass type, char const* name, char const* signature) {
-    return original->GetMethodID(env, type, Hide(name), signature);
-}
-
 // Loads the bridge where one name is missing.
 int LoadWithout(char const* name) {
     JNIEnv* const env = JavaMachine::GetMainEnv();
-    PatchedFunctions functions(env);
-    hidden = name;
-    original = &functions.GetOriginal();
-    functions->FindClass = &FindClass;
-    functions->GetStaticMethodID = &GetStaticMethodID;
-    functions->GetMethodID = &GetMethodID;
+    MissingName const missing(env, name);
     int const result = MKBitmapFactory_OnLoad(JavaMachine::GetVm(), env);
     EXPECT_FALSE(env->ExceptionCheck()) << name;
     return result;

@@ -3,6 +3,7 @@
 #pragma once
 
 #include <jni.h>
+#include <string>
 
 namespace Moka::Testing {
 
@@ -22,6 +23,33 @@ private:
     JNIEnv* const mEnv;
     JNINativeInterface_ const* const mOriginal;
     JNINativeInterface_ mPatched;
+};
+
+// For a scope, a lookup by this name finds nothing, however the class path looks.
+class MissingName {
+public:
+    MissingName(JNIEnv* env, char const* name) : mFunctions(env) {
+        sMissing = name;
+        sOriginal = &mFunctions.GetOriginal();
+        mFunctions->FindClass = [](JNIEnv* e, char const* type) {
+            return sOriginal->FindClass(e, Hide(type));
+        };
+        mFunctions->GetStaticMethodID = [](JNIEnv* e, jclass type, char const* method,
+                                           char const* signature) {
+            return sOriginal->GetStaticMethodID(e, type, Hide(method), signature);
+        };
+        mFunctions->GetMethodID = [](JNIEnv* e, jclass type, char const* method, char const* signature) {
+            return sOriginal->GetMethodID(e, type, Hide(method), signature);
+        };
+    }
+    JNINativeInterface_* operator->() { return mFunctions.operator->(); }
+
+private:
+    static char const* Hide(char const* name) { return sMissing == name ? "isNotThere" : name; }
+
+    static inline std::string sMissing;
+    static inline JNINativeInterface_ const* sOriginal;
+    PatchedFunctions mFunctions;
 };
 
 } // namespace Moka::Testing

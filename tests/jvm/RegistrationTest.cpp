@@ -79,6 +79,31 @@ TEST(Registration, FinalizeDestroysTheDisplay) {
     EXPECT_EQ(CountedDisplay::destroyed, 1);
 }
 
+// What is looked up next is looked up under the first one's exception, which nobody is to clear.
+TEST(Registration, AClassThatIsMissingIsTheExceptionOfTheLoading) {
+    JNIEnv* const env = JavaMachine::GetMainEnv();
+    struct {
+        char const* name;
+        char const* line;
+    } const cases[] = {
+        {"com/velmora/android/sdk/pen/graphics/MokaBitmapLoader", "Cannot find BitmapLoader Class"},
+        {"com/velmora/android/sdk/pen/view/MokaDisplay", "Cannot find Display Class"},
+        {"no class", "RegisterNatives is failed"},
+    };
+    for (auto const& [name, line] : cases) {
+        LogCapture const log;
+        {
+            MissingName missing(env, name);
+            missing->RegisterNatives = &RegisterNatives;
+            registration = -1; // or the loader's thread would be started
+            JNI_OnLoad(JavaMachine::GetVm(), nullptr);
+        }
+        EXPECT_EQ(env->ExceptionCheck(), std::string(name) != "no class") << name;
+        env->ExceptionClear();
+        EXPECT_GE(log.Count(ANDROID_LOG_INFO, line) + log.Count(ANDROID_LOG_ERROR, line), 1) << name;
+    }
+}
+
 TEST(Registration, AVmThatIsTooOldIsRefused) {
     JNIInvokeInterface_ functions = {};
     JavaVM vm = {};

@@ -10,9 +10,6 @@ using Moka::Testing::FailAllocations;
 using Moka::Testing::NoArrayMemory;
 
 thread_local int allocations = 0;
-std::atomic<void const*> watched{nullptr};
-std::atomic<int> arrayDeletes{0};
-std::atomic<int> plainDeletes{0};
 std::atomic<std::size_t> liveBytes{0};
 std::atomic<std::size_t> peakBytes{0};
 constexpr std::size_t kPrefix = 16; // for the size of an array; keeps the alignment
@@ -38,14 +35,8 @@ void* OrThrow(void* block) {
     return block;
 }
 
-void Free(void* block) noexcept {
-    if (block && block == watched) ++plainDeletes;
-    std::free(block);
-}
-
 void FreeArray(void* memory) noexcept {
     if (!memory) return;
-    if (memory == watched) ++arrayDeletes;
     auto* const block = static_cast<unsigned char*>(memory) - kPrefix;
     liveBytes -= *reinterpret_cast<std::size_t*>(block);
     std::free(block);
@@ -59,26 +50,17 @@ void* operator new(std::size_t size, std::nothrow_t const&) noexcept { return Al
 void* operator new[](std::size_t size, std::nothrow_t const&) noexcept {
     return NoArrayMemory::sArrays > 0 ? nullptr : AllocateArray(size);
 }
-void operator delete(void* block) noexcept { Free(block); }
+void operator delete(void* block) noexcept { std::free(block); }
 void operator delete[](void* block) noexcept { FreeArray(block); }
-void operator delete(void* block, std::size_t) noexcept { Free(block); }
+void operator delete(void* block, std::size_t) noexcept { std::free(block); }
 void operator delete[](void* block, std::size_t) noexcept { FreeArray(block); }
-void operator delete(void* block, std::nothrow_t const&) noexcept { Free(block); }
+void operator delete(void* block, std::nothrow_t const&) noexcept { std::free(block); }
 void operator delete[](void* block, std::nothrow_t const&) noexcept { FreeArray(block); }
 
 namespace Moka::Testing {
 
 thread_local int FailAllocations::sAll = 0;
 thread_local int NoArrayMemory::sArrays = 0;
-
-DeleteWatch::DeleteWatch(void const* block) {
-    arrayDeletes = 0;
-    plainDeletes = 0;
-    watched = block;
-}
-DeleteWatch::~DeleteWatch() { watched = nullptr; }
-int DeleteWatch::GetArrayDeletes() const { return arrayDeletes; }
-int DeleteWatch::GetPlainDeletes() const { return plainDeletes; }
 
 std::size_t ArrayMemory::GetLive() { return liveBytes; }
 std::size_t ArrayMemory::GetPeak() { return peakBytes; }

@@ -27,18 +27,6 @@ public:
     static thread_local int sArrays;
 };
 
-// Counts how often one block is given to operator delete[], and to the plain operator delete. One at a time.
-class DeleteWatch {
-public:
-    explicit DeleteWatch(void const* block);
-    ~DeleteWatch();
-    DeleteWatch(DeleteWatch const&) = delete;
-    DeleteWatch& operator=(DeleteWatch const&) = delete;
-
-    int GetArrayDeletes() const;
-    int GetPlainDeletes() const;
-};
-
 // Bytes allocated by array new and not deleted, in the whole process: pixel buffers and little else.
 class ArrayMemory {
 public:

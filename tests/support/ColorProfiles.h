@@ -9,13 +9,9 @@ namespace Moka::Testing {
 
 using FileBytes = std::vector<unsigned char>;
 
-enum class ProfileKind {
-    Srgb,
-    DisplayP3,  // sRGB's curve, wider primaries
-    LinearGrey, // numbers are light
-    Cmyk,       // a table: paper is white, full black ink black, full cyan ink the colour L 50, a -40, b -40
-};
-FileBytes MakeProfile(ProfileKind kind);
+// One of fuzz/corpus/profile: "srgb"; "p3", sRGB's curve and wider primaries; "grey", whose numbers are light; "ink",
+// a table where paper is white, full black ink black and full cyan ink the colour L 50, a -40, b -40.
+FileBytes ReadProfile(std::string const& name);
 
 // A copy of a file of this tree's encoders with the profile; a PNG loses its mark "sRGB". Parts of a JPEG's
 // profile hold partBytes at most, and stand last to first.

@@ -139,12 +139,6 @@ std::string RendererTrace::GetActiveTarget() {
     return NameOf(recorder ? recorder->GetActive() : nullptr);
 }
 
-std::string RendererTrace::GetParameter(IShaderProgram const* program, std::string const& name) {
-    Access const trace;
-    auto const& values = trace->objects.at(program).values;
-    return values.count(name) > 0 ? values.at(name).text : "";
-}
-
 int RendererTrace::CountLiveObjects() {
     Access const trace;
     auto const live = std::count_if(trace->objects.begin(), trace->objects.end(),

@@ -17,7 +17,6 @@
 #include <vector>
 
 namespace Moka {
-class IShaderProgram;
 class ITextureObject;
 } // namespace Moka
 
@@ -93,8 +92,6 @@ public:
 
     // Names as in the calls, "none" for nothing.
     static std::string GetActiveTarget();
-    // What a uniform was set to last: its numbers, separated by spaces; empty before.
-    static std::string GetParameter(IShaderProgram const* program, std::string const& name);
 
     // Objects not yet released, and handles on parameters not yet deleted, of whatever context.
     static int CountLiveObjects();

@@ -1,12 +1,12 @@
 // Works with the library for as many operations as the argument says, and fails when memory or renderer
 // objects grow after the first fifth.
-#include "tests/trust/Soak.h"
-
 #include "moka/base/RefPtr.h"
 #include "moka/base/log/LogSink.h"
 #include "moka/graphics/drawable/MKBlendedBitmapDrawable.h"
 #include "moka/graphics/drawable/MKGaussianBlurDrawable.h"
 #include "moka/graphics/drawable/MKTextMaskBitmapDrawable.h"
+#include "moka/host/RenderThread.h"
+#include "moka/renderer/RendererFactory.h"
 #include "tests/trust/MixedWork.h"
 
 #include <algorithm>
@@ -50,6 +50,26 @@ double GetResidentBytes() {
     while (file >> word)
         if (word == "RssAnon:") file >> kilobytes;
     return kilobytes * 1024;
+}
+
+std::unique_ptr<IGLMsgQueue> StartRenderThread() {
+    RenderThreadOptions options;
+    options.limits.maxTextureSize = MixedWork::kSide;
+    options.debugContext = true;
+    options.surfaceWidth = MixedWork::kSide; // the screen bitmaps need a default frame buffer
+    options.surfaceHeight = MixedWork::kSide;
+    std::string error;
+    auto thread = RenderThread::Start(options, &error);
+    if (!thread) std::fprintf(stderr, "no render thread: %s\n", error.c_str());
+    return thread;
+}
+
+// What the driver reported counts too: none of it may come.
+int CountRendererObjects() {
+    RendererStatistics const s = RendererFactory::GetStatistics();
+    return s.textures + s.samplers + s.frameBuffers + s.renderBuffers + s.pooledRenderBuffers +
+           s.renderTargets + s.textureObjects + s.depthStencilBuffers + s.programs + s.graphicsObjects +
+           s.stateObjects + s.buffers + static_cast<int>(s.errors);
 }
 
 // Works until calls have been made, never far ahead of the render thread.

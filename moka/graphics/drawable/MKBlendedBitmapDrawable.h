@@ -29,6 +29,13 @@ public:
     void SetRects(RectF const& src, RectF const& dst);
     void SetSize(float width, float height);
 
+    IMKBitmap* GetBitmapFirst() const { return mBitmap.Get(); }
+    IMKBitmap* GetBitmapSecond() const { return mSecondBitmap.Get(); }
+    RectF const& GetSrc() const { return mSrc; }
+    RectF const& GetDst() const { return mDst; }
+    float GetWidth() const { return mWidth; }
+    float GetHeight() const { return mHeight; }
+
     void DrawRT(Matrix4<float> const& projection, MKPaint const& paint) override;
 
 private:

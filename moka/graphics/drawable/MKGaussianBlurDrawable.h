@@ -31,6 +31,11 @@ public:
     /// Shifts the content, not the rectangle it is drawn into. The paint's tile mode fills the edges.
     void SetOffset(float x, float y) { mOffset = {x, y}; }
 
+    IMKBitmap* GetBitmap() const { return mBitmap.Get(); }
+    bool IsHorizontal() const { return mHorizontal; }
+    float GetBlurAmount() const { return mAmount; }
+    PointF const& GetOffset() const { return mOffset; }
+
     void DrawRT(Matrix4<float> const& projection, MKPaint const& paint) override;
 
 private:

@@ -20,6 +20,9 @@ public:
     /// src over dst; takes a reference on each.
     void SetBitmap(IMKBitmap* src, IMKBitmap* dst);
 
+    IMKBitmap* GetSrc() const { return mBitmap.Get(); }
+    IMKBitmap* GetDst() const { return mSecondBitmap.Get(); }
+
     void DrawRT(Matrix4<float> const& projection, MKPaint const& paint) override;
 };
 

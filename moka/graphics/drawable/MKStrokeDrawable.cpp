@@ -120,6 +120,12 @@ MKStrokeDrawable::MKStrokeDrawable(IGLMsgQueue* queue)
 
 MKStrokeDrawable::~MKStrokeDrawable() = default;
 
+// Draws read the points; what changes them is posted by the thread that waits here.
+std::vector<MKStrokePoint> MKStrokeDrawable::ReadPoints() {
+    if (mQueue) mQueue->WaitForTasks();
+    return mStroke->GetPoints();
+}
+
 void MKStrokeDrawable::Append(MKStrokePoint const* points, int count) {
     if (!points || count < 1 || !mQueue) return;
     std::vector<MKStrokePoint> kept = CopyKept(points, count);

@@ -24,6 +24,9 @@ public:
     /// Of the mask's upper left corner; the origin unless set.
     void SetDstPosition(float x, float y) { mPosition = {x, y}; }
 
+    IMKBitmap* GetBitmap() const { return mBitmap.Get(); }
+    PointF const& GetDstPosition() const { return mPosition; }
+
     void DrawRT(Matrix4<float> const& projection, MKPaint const& paint) override;
 
 private:

@@ -317,7 +317,7 @@ void StrokeCells::MakeCell(int node, Square const& square, std::size_t begin) {
     int points = 0;
     int joined = 0;
     auto const put = [&](StrokeNode const& point) {
-        float* const at = cell.points + 3 * points++;
+        float* const at = cell.points + std::ptrdiff_t{3} * points++;
         at[0] = static_cast<float>(point.x - square.x);
         at[1] = static_cast<float>(point.y - square.y);
         at[2] = static_cast<float>(point.radius);
@@ -325,7 +325,7 @@ void StrokeCells::MakeCell(int node, Square const& square, std::size_t begin) {
     int last = -2;
     for (std::size_t i = begin; i < mCandidates.size(); ++i) {
         int const segment = mCandidates[i].segment;
-        if (segment != last + 1) put(mSegments[At(segment)].a);
+        if (points == 0 || segment != last + 1) put(mSegments[At(segment)].a);
         joined |= 1 << (points - 1);
         put(mSegments[At(segment)].b);
         last = segment;

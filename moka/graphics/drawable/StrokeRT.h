@@ -21,6 +21,7 @@ public:
     // bad_alloc leaves the stroke as it was.
     void Append(std::vector<MKStrokePoint> const& points);
     void Clear();
+    std::vector<MKStrokePoint> const& GetPoints() const { return mPoints; }
 
     bool IsEmpty() const { return mPoints.empty(); }
     // Of a stroke that is not empty.

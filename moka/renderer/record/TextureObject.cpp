@@ -171,6 +171,21 @@ bool TextureObject::IsActiveTarget() const {
     return active && active->GetRef().texture == mStorage->GetName();
 }
 
+int TextureObject::GetParameter(int id) const {
+    switch (id) {
+    case TextureParamWrappingS:
+        return mSampling.wrapS;
+    case TextureParamWrappingT:
+        return mSampling.wrapT;
+    case TextureParamFilteringMin:
+        return mSampling.minFilter;
+    case TextureParamFilteringMag:
+        return mSampling.magFilter;
+    default:
+        return -1;
+    }
+}
+
 int TextureObject::GetWidth() const { return mStorage->GetWidth(); }
 
 int TextureObject::GetHeight() const { return mStorage->GetHeight(); }

@@ -31,6 +31,7 @@ public:
     void CopyFromRenderTarget() override;
     int GetWidth() const override;
     int GetHeight() const override;
+    int GetParameter(int id) const override;
 
 private:
     void Upload(Rect const& rect, void const* pixels, int stride);

@@ -1,20 +1,13 @@
 // What is drawn onto a bitmap that has no frame buffer goes nowhere, and not into the host's window.
-#include "moka/base/RefPtr.h"
-#include "moka/base/log/AndroidLog.h"
 #include "moka/graphics/bitmap/IMKBitmap.h"
 #include "moka/graphics/bitmap/IMKSubBitmap.h"
 #include "moka/graphics/bitmap/IMKTextureBitmap.h"
 #include "moka/graphics/drawable/MKNonPremultipliedColorDrawable.h"
-#include "moka/graphics/factory/BitmapsAndCanvases.h"
 #include "moka/graphics/paint/MKPaint.h"
-#include "moka/host/RenderThread.h"
 #include "moka/renderer/IRenderTarget.h"
-#include "moka/renderer/RendererFactory.h"
 #include "scenes/SceneRenderer.h"
+#include "tests/pixel/RenderThreadFixture.h"
 #include "tests/support/ImageCompare.h"
-#include "tests/support/LogCapture.h"
-#include "tests/support/NothingLeft.h"
-#include "tests/support/TestImages.h"
 
 #include <gtest/gtest.h>
 
@@ -42,29 +35,21 @@ private:
     int mLeft = 0;
 };
 
-class NoFrameBuffer : public ::testing::Test {
+class NoFrameBuffer : public RenderThreadFixture {
 protected:
+    NoFrameBuffer() : RenderThreadFixture(kMaxSide, kSide) {}
+
     void SetUp() override {
-        RenderThreadOptions options;
-        options.limits.maxTextureSize = kMaxSide;
-        options.debugContext = true;
-        options.surfaceWidth = options.surfaceHeight = kSide;
-        std::string error;
-        thread = RenderThread::Start(options, &error);
-        ASSERT_TRUE(thread) << error;
+        RenderThreadFixture::SetUp();
         queue = std::make_unique<PickyQueue>(*thread);
         thread->Call([this] {
             window = RendererFactory::CreateRenderTargetFromDefault(kSide, kSide);
             window->ClearColor(0.2f, 0.4f, 0.6f, 1);
         });
     }
-
     void TearDown() override {
         thread->Call([this] { window->Release(); });
-        thread->WaitForTasks(); // what goes last posts the end of what it held
-        ExpectNothingLeft(RendererFactory::GetStatistics());
-        thread.reset();
-        for (std::string const& line : log.GetTexts(ANDROID_LOG_ERROR)) ADD_FAILURE() << line;
+        RenderThreadFixture::TearDown();
     }
 
     BitmapPtr Create(int width, int height, void const* pixels = nullptr) {
@@ -89,8 +74,6 @@ protected:
         EXPECT_EQ(CompareImages(expected, ReadWindow()).differingPixels, 0) << what;
     }
 
-    LogCapture log;
-    std::unique_ptr<RenderThread> thread;
     std::unique_ptr<PickyQueue> queue;
     IRenderTarget* window = nullptr;
 };

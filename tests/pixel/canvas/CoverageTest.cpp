@@ -1,4 +1,4 @@
-// Edges: at a corner by hand, and far from the origin. Scenes and RandomTest draw all the others.
+// Edges far from the origin. Scenes and RandomTest draw all the others.
 #include "tests/pixel/canvas/CanvasDrawing.h"
 
 namespace Moka::Testing {
@@ -14,23 +14,6 @@ MKPaint MakePaint(MKPaint::Style style, float width) {
 }
 
 using CoverageTest = CanvasDrawing;
-
-TEST_F(CoverageTest, ACornerTakesTheLesserOfItsTwoRamps) {
-    MKPaint paint;
-    paint.SetAntiAliasing(true);
-    Picture const picture = Draw({Picture(20, 20), [&](IMKCanvas& canvas, Scenes::SceneStage&) {
-                                      canvas.DrawRect(3.25f, 4.5f, 12, 12.75f, &paint);
-                                  }});
-    auto const alpha = [&](int x, int y) { return int{picture.GetColor(x, y)[3]}; };
-    EXPECT_NEAR(alpha(3, 8), 0.75 * 255, 1);
-    EXPECT_NEAR(alpha(8, 4), 0.5 * 255, 1);
-    EXPECT_NEAR(alpha(3, 4), 0.5 * 255, 1);
-    EXPECT_NEAR(alpha(3, 12), 0.75 * 255, 1);
-    EXPECT_NEAR(alpha(12, 12), 0, 1);
-    EXPECT_NEAR(alpha(11, 12), 0.75 * 255, 1);
-    EXPECT_EQ(alpha(2, 8), 0);
-    EXPECT_EQ(alpha(7, 7), 255);
-}
 
 // Through a window of 90 x 80 units at (left, top): a mediump float of 16 bits overflows when a distance above
 // 256 is squared, and tells places above 1024 apart to a whole unit only.

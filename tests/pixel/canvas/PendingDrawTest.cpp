@@ -68,41 +68,29 @@ protected:
     }
 };
 
-TEST_F(PendingDrawTest, AReadBackWaits) {
-    EXPECT_EQ(CountWrong([](Drawn const& drawn) { return Read(*drawn.bitmap); }), 0);
-}
-
-TEST_F(PendingDrawTest, TheCloneOfAStripWaits) {
-    EXPECT_EQ(CountWrong([](Drawn const& drawn) {
-                  auto const clone =
-                      RefPtr<IMKSubBitmap>::Adopt(drawn.bitmap->GetTextureBitmap()->GetSubBitmap(0)->Clone());
-                  return Read(*clone);
-              }),
-              0);
-}
-
-// White darkens nothing, so what comes back is the copy that it was compared with. A canvas keeps the copy's
-// texture, and overwriting one that was sampled waits by itself; hence a new canvas each time.
-TEST_F(PendingDrawTest, TheDestinationsCopyForDarkenWaits) {
+TEST_F(PendingDrawTest, EveryWayOutOfABitmapWaits) {
+    EXPECT_EQ(CountWrong([](Drawn const& drawn) { return Read(*drawn.bitmap); }), 0) << "read back";
+    auto const readClone = [](Drawn const& drawn) {
+        return Read(*RefPtr<IMKSubBitmap>::Adopt(drawn.bitmap->GetTextureBitmap()->GetSubBitmap(0)->Clone()));
+    };
+    EXPECT_EQ(CountWrong(readClone), 0) << "the clone of a strip";
+    // White darkens nothing, so what comes back is the copy that it was compared with. A canvas keeps the copy's
+    // texture, and overwriting one that was sampled waits by itself; hence a new canvas each time.
     Drawn const white = Make();
     Fill(white, kOld);
-    EXPECT_EQ(CountWrong([&](Drawn const& drawn) {
-                  MKPaint darken;
-                  darken.SetXFermode(MKPaint::Darken);
-                  auto const canvas = NewCanvas(GetRenderThread(), drawn.bitmap);
-                  canvas->DrawBitmap(white.bitmap.Get(), 0, 0, &darken);
-                  return Read(*drawn.bitmap);
-              }),
-              0);
-}
-
-TEST_F(PendingDrawTest, TheCopyOfABitmapDrawnOntoItselfWaits) {
+    auto const darken = [&](Drawn const& drawn) {
+        MKPaint paint;
+        paint.SetXFermode(MKPaint::Darken);
+        NewCanvas(GetRenderThread(), drawn.bitmap)->DrawBitmap(white.bitmap.Get(), 0, 0, &paint);
+        return Read(*drawn.bitmap);
+    };
+    EXPECT_EQ(CountWrong(darken), 0) << "the destination's copy for darken";
     kept = 2; // a texture and its frame buffer
-    EXPECT_EQ(CountWrong([](Drawn const& drawn) {
-                  drawn.canvas->DrawBitmap(drawn.bitmap.Get(), 0, 0, nullptr);
-                  return Read(*drawn.bitmap);
-              }),
-              0);
+    auto const drawOntoItself = [](Drawn const& drawn) {
+        drawn.canvas->DrawBitmap(drawn.bitmap.Get(), 0, 0, nullptr);
+        return Read(*drawn.bitmap);
+    };
+    EXPECT_EQ(CountWrong(drawOntoItself), 0) << "the copy of a bitmap that is drawn onto itself";
 }
 
 } // namespace

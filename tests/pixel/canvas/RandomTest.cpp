@@ -12,10 +12,6 @@ namespace {
 constexpr int kWidth = 160;
 constexpr int kHeight = 120;
 
-constexpr MKPaint::XFermode kModes[] = {MKPaint::SrcOver, MKPaint::SrcOver, MKPaint::SrcAtop,
-                                        MKPaint::Darken,  MKPaint::SrcOver, MKPaint::Src,
-                                        MKPaint::DstOut,  MKPaint::Lighten};
-
 class RandomScene {
 public:
     RandomScene(unsigned seed, int top) : mRandom(seed), mTop(top) {}
@@ -51,7 +47,7 @@ public:
             if (Flip())
                 canvas.PreRotate(Between(-90, 90), static_cast<float>(x) + 20, static_cast<float>(y) + 20);
             ChangePaint();
-            mPaint.SetXFermode(kModes[Below(8)]);
+            mPaint.SetXFermode(static_cast<MKPaint::XFermode>(Below(19)));
             mPaint.SetTileMode(static_cast<MKPaint::TileMode>(Below(3)));
             DrawShape(canvas, *bitmap,
                       {static_cast<float>(x) + Between(3, 10), static_cast<float>(y) + Between(3, 10)}, 24);
@@ -86,6 +82,8 @@ private:
     }
 
     void ChangePaint() {
+        static constexpr MKPaint::XFermode kModes[] = {MKPaint::SrcOver, MKPaint::SrcOver, MKPaint::SrcAtop,
+                                                       MKPaint::Darken};
         if (Below(10) == 0) mMode = kModes[Below(4)];
         mPaint = MKPaint();
         mPaint.SetXFermode(mMode);

@@ -80,23 +80,5 @@ INSTANTIATE_TEST_SUITE_P(All, SceneInStrips,
                          ::testing::ValuesIn(GetNames([](Scene const& s) { return !s.needsGpu; })),
                          ToTestName);
 
-class SceneInThreeStrips : public SceneTest {};
-
-TEST_P(SceneInThreeStrips, IsTheSameAsOnOne) {
-    Drawing const drawing = ToDrawing(GetScene());
-    Picture const whole = Draw(drawing);
-    UseLargestSide(Scenes::GetSideForThreeStrips(GetScene()));
-    Picture const strips = Draw(drawing);
-    ReferencePicture const reference = DrawReference(drawing, Scenes::GetSideForThreeStrips(GetScene()));
-    ExpectLike(reference, strips, GetParam() + " in three strips");
-    // A source cut into strips does not blend over its cuts.
-    if (DrawReference(drawing, kLarge).image.pixels == reference.image.pixels)
-        ExpectSame(whole, strips, GetParam() + " whole and in strips", &reference.slack);
-}
-
-INSTANTIATE_TEST_SUITE_P(All, SceneInThreeStrips,
-                         ::testing::ValuesIn(GetNames([](Scene const& s) { return s.alsoInStrips; })),
-                         ToTestName);
-
 } // namespace
 } // namespace Moka::Testing

@@ -250,17 +250,5 @@ TEST_F(ShaderTest, TheBlurWeighsFourNeighboursOnEachSideOfOneAxis) {
     }
 }
 
-TEST_F(ShaderTest, AFragmentOnACirclesOutermostEdgeIsKeptAndCoversNothing) {
-    SharedShader<MKCircleShader> const shader;
-    shader->uProjectionMatrix = GetProjection();
-    shader->uColor = kColor;
-    shader->uIsFill = 1;
-    shader->uCenter = Vector2<float>(0.5f, 0.5f);
-    shader->uRadius = 4.5f; // the centre of pixel 5 lies 5 away
-    Picture const drawn = Draw([](float x, float y) { return std::vector<float>{x, y}; });
-    EXPECT_EQ(drawn.GetColor(5, 0), kClear);
-    EXPECT_EQ(drawn.GetColor(6, 0), kBackground);
-}
-
 } // namespace
 } // namespace Moka::Testing

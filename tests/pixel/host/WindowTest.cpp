@@ -214,31 +214,6 @@ TEST_F(WindowTest, AWindowThatIsDestroyedWhileFramesWaitIsOneLineAndTheThreadGoe
     EXPECT_EQ(log.Count(ANDROID_LOG_ERROR, ""), 1);
 }
 
-TEST_F(WindowTest, OneWindowAtATimeAndTheNextWhenItHasStopped) {
-    auto const second = XWindow::Open(32, 32);
-    RenderThreadOptions other = options;
-    other.nativeWindow = second->GetWindow();
-    other.nativeDisplay = second->GetDisplay();
-    EXPECT_FALSE(RenderThread::Start(other, &error));
-    EXPECT_THAT(error, HasSubstr("stop it first"));
-    Fill(*thread, kWidth, kHeight, kRed, kRed);
-    EXPECT_TRUE(thread->Present());
-    EXPECT_TRUE(ShowsSoon(kWidth - 5, kHeight - 5, kRed)); // the second one covers the corner
-
-    options = other;
-    Start();
-    ASSERT_TRUE(thread) << error;
-    window->Destroy(); // of the one before: nobody minds
-    Fill(*thread, 32, 32, kBlue, kBlue);
-    EXPECT_TRUE(thread->Present());
-    for (int i = 0; i < 500 && second->GetPixel(5, 20) != kBlue; ++i) {
-        std::this_thread::sleep_for(milliseconds(10));
-    }
-    EXPECT_EQ(second->GetPixel(5, 20), kBlue);
-    EXPECT_THAT(log.GetTexts(ANDROID_LOG_ERROR), ElementsAre());
-    thread.reset();
-}
-
 TEST_F(WindowTest, WhatIsNotThereIsToldAndEndsNothing) {
     thread.reset();
     RenderThreadOptions missing = options;

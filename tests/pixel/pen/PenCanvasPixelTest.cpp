@@ -1,25 +1,15 @@
-// The pen canvas around real foreign GL: the ink lies where its matrix and clip say, and whatever the foreign
-// code leaves behind, the library's own draws before and after it are right.
+// The pen canvas around real external GL: the ink lies where its matrix and clip say, and whatever the external code
+// leaves behind, the library's own draws before and after it are right. With deferral, and without.
 #include "apps/moka/PenStroke.h"
-#include "moka/base/RefPtr.h"
-#include "moka/base/log/AndroidLog.h"
-#include "moka/graphics/bitmap/IMKBitmap.h"
 #include "moka/graphics/bitmap/IMKBitmapWritable.h"
-#include "moka/graphics/canvas/IMKCanvas.h"
-#include "moka/graphics/canvas/IMKPenCanvas.h"
-#include "moka/graphics/factory/BitmapsAndCanvases.h"
 #include "moka/graphics/paint/MKPaint.h"
-#include "moka/host/RenderThread.h"
-#include "moka/renderer/RendererFactory.h"
 #include "scenes/SceneRenderer.h"
-#include "tests/pixel/pen/ForeignInk.h"
+#include "tests/pixel/RenderThreadFixture.h"
 #include "tests/support/ImageCompare.h"
-#include "tests/support/LogCapture.h"
-#include "tests/support/NothingLeft.h"
-#include "tests/support/TestImages.h"
 
-#include <functional>
+#include <GLES3/gl3.h>
 #include <gtest/gtest.h>
+
 #include <memory>
 #include <string>
 #include <vector>
@@ -34,97 +24,119 @@ constexpr int kWidth = 40;
 constexpr int kHeight = 26;
 constexpr Color kPaper{10, 20, 30, 255};
 constexpr Color kInk{0, 255, 0, 255};
-
-Picture Paper() { return MakeChecker(kWidth, kHeight, kWidth + kHeight, kPaper, kPaper); }
+constexpr Color kWhite{255, 255, 255, 255};
+constexpr Color kRed{255, 0, 0, 255};
 
 void FillImage(Picture& image, Rect const& r, Color const& color) {
     for (int y = r.top; y < r.bottom; ++y)
         for (int x = r.left; x < r.right; ++x) image.SetColor(x, y, color);
 }
 
-void FillGradient(Picture& image, Rect const& r) {
-    for (int y = r.top; y < r.bottom; ++y)
-        for (int x = r.left; x < r.right; ++x) image.SetColor(x, y, GetGradientColor(x - r.left, y - r.top));
+// Everything that a draw depends on, so that nothing could be drawn with it, or the wrong thing.
+void LeaveAMess(GLuint texture, GLuint sampler) {
+    for (int const test : {GL_BLEND, GL_SCISSOR_TEST, GL_STENCIL_TEST, GL_DEPTH_TEST, GL_CULL_FACE})
+        glEnable(static_cast<GLenum>(test));
+    glBlendEquation(GL_FUNC_REVERSE_SUBTRACT);
+    glBlendFunc(GL_ZERO, GL_ZERO);
+    glColorMask(GL_FALSE, GL_TRUE, GL_FALSE, GL_FALSE);
+    glScissor(1, 1, 2, 2);
+    glViewport(3, 3, 5, 4);
+    glStencilFunc(GL_NEVER, 0, 255);
+    glStencilMask(0);
+    glDepthFunc(GL_NEVER);
+    glCullFace(GL_FRONT_AND_BACK);
+    for (GLenum unit = 0; unit < 3; ++unit) {
+        glActiveTexture(GL_TEXTURE0 + unit);
+        glBindTexture(GL_TEXTURE_2D, texture); // has no image
+        glBindSampler(unit, sampler);
+    }
+    glPixelStorei(GL_UNPACK_ALIGNMENT, 8);
+    glPixelStorei(GL_UNPACK_SKIP_ROWS, 2);
+    glPixelStorei(GL_PACK_ROW_LENGTH, 3);
+    glBindFramebuffer(GL_FRAMEBUFFER, 0);
+    glClearColor(1, 0, 1, 1);
 }
 
-// With deferral, and without.
-class PenCanvasPixel : public ::testing::TestWithParam<bool> {
+class PenCanvasPixel : public RenderThreadFixture, public ::testing::WithParamInterface<bool> {
 protected:
     void SetUp() override {
-        RenderThreadOptions options;
-        options.debugContext = true;
-        std::string error;
-        queue = RenderThread::Start(options, &error);
-        ASSERT_TRUE(queue) << error;
-        queue->Call([this] {
+        RenderThreadFixture::SetUp();
+        thread->Call([this] {
             RendererFactory::SetDeferred(GetParam());
-            ink = std::make_unique<ForeignInk>();
+            ink = Tool::GlInk::Create();
+            glGenTextures(1, &texture);
+            glGenSamplers(1, &sampler);
         });
-        bitmap = Create(Paper());
-        pen = NewPenCanvas(*queue, bitmap);
-        canvas = NewCanvas(*queue, bitmap);
+        bitmap = Create(expected);
+        pen = NewPenCanvas(*thread, bitmap);
+        canvas = NewCanvas(*thread, bitmap);
     }
 
-    // Nothing alive on the GPU, and no driver message of error severity.
     void TearDown() override {
         pen = {};
         canvas = {};
         bitmap = {};
-        queue->Call([this] {
+        thread->Call([this] {
             RendererFactory::Flush();
+            glDeleteSamplers(1, &sampler);
+            glDeleteTextures(1, &texture);
             ink.reset();
+            EXPECT_EQ(glGetError(), static_cast<GLenum>(GL_NO_ERROR));
             RendererFactory::InvalidateState();
         });
-        queue->WaitForTasks();
-        ExpectNothingLeft(RendererFactory::GetStatistics());
-        queue.reset();
-        for (std::string const& line : log.GetTexts(ANDROID_LOG_ERROR)) ADD_FAILURE() << line;
-    }
-
-    BitmapPtr Create(Picture const& image) {
-        auto created = NewBitmap(*queue, image.width, image.height, image.pixels.data());
-        queue->WaitForTasks(); // the image may go
-        return created;
-    }
-
-    Picture Read() {
-        Picture image(kWidth, kHeight);
-        bitmap->GetBitmapData(bitmap->GetBitmapRect(), image.pixels.data());
-        return image;
+        RenderThreadFixture::TearDown();
     }
 
     // What the pen engine does on the render thread, behind what was asked for before.
     void DrawInk(RectF const& rect) {
-        queue->Call([&] {
+        thread->Call([&] {
             pen->EnableClipRT(0);
             bitmap->GetBitmapWritable()->ActivateFrameBufferRT(false);
-            ink->Fill(rect, pen->GetCanvasMatrix());
-            ink->LeaveAMess();
+            // In the middle of ink that is wide enough to be solid.
+            ink->Draw(pen->GetCanvasMatrix(),
+                      {{rect.left, rect.top, 0, 1},
+                       {rect.left, rect.bottom, 0, 1},
+                       {rect.right, rect.top, 0, 1},
+                       {rect.right, rect.bottom, 0, 1}},
+                      {0, 1, 0, 1});
+            LeaveAMess(texture, sampler);
+            ink->Bind();
+            EXPECT_EQ(glGetError(), static_cast<GLenum>(GL_NO_ERROR));
             pen->DisableClipRT();
             bitmap->GetBitmapWritable()->DeactivateFrameBufferRT(false, DiscardFramebufferNone);
         });
     }
-
-    static void ExpectSame(Picture const& expected, Picture const& actual, std::string const& what) {
-        ImageDifference const difference = CompareImages(expected, actual);
-        if (difference.differingPixels == 0) return;
-        ADD_FAILURE() << what << ": " << difference << "; " << KeepDifference(expected, actual, what);
+    void DrawInkAt(int x) {
+        DrawInk(RectF(static_cast<float>(x), 0, static_cast<float>(x) + 1, 1));
+        FillImage(expected, Rect(x, 0, x + 1, 1), kInk);
+    }
+    void DrawPicture(int x, int y, Picture const& picture) {
+        canvas->DrawBitmap(Create(picture).Get(), static_cast<float>(x), static_cast<float>(y), nullptr);
+        expected = expected.With(x, y, picture);
     }
 
-    LogCapture log;
-    std::unique_ptr<RenderThread> queue;
-    std::unique_ptr<ForeignInk> ink; // render thread
+    void ExpectPicture(std::string const& what) {
+        Picture image(kWidth, kHeight);
+        bitmap->GetBitmapData(bitmap->GetBitmapRect(), image.pixels.data());
+        ImageDifference const difference = CompareImages(expected, image);
+        if (difference.differingPixels > 0)
+            ADD_FAILURE() << what << ": " << difference << "; " << KeepDifference(expected, image, what);
+    }
+
+    std::unique_ptr<Tool::GlInk> ink; // render thread, like the names
+    GLuint texture = 0;
+    GLuint sampler = 0;
     BitmapPtr bitmap;
     RefPtr<IMKPenCanvas> pen;
     RefPtr<IMKCanvas> canvas;
-};
-
-struct Clip {
-    int x, y, width, height;
-    C::ClipOp op;
+    Picture expected = MakeChecker(kWidth, kHeight, kWidth + kHeight, kPaper, kPaper);
 };
 
 TEST_P(PenCanvasPixel, InkIsDrawnInsideTheClipAndNotOutside) {
+    struct Clip {
+        int x, y, width, height;
+        C::ClipOp op;
+    };
     struct Case {
         std::vector<Clip> clips; // in pixels of the bitmap
         Rect inked;
@@ -141,34 +153,30 @@ TEST_P(PenCanvasPixel, InkIsDrawnInsideTheClipAndNotOutside) {
         pen->PreScale(2, 1);
         DrawInk(RectF(0, 0, 10, 10)); // covers (4, 2) to (24, 12)
         pen->Restore(level);
-        Picture expected = Paper();
+        FillImage(expected, Rect(0, 0, kWidth, kHeight), kPaper);
         FillImage(expected, c.inked, kInk);
-        ExpectSame(expected, Read(), "ink under " + std::to_string(c.clips.size()) + " clips");
+        ExpectPicture("ink under " + std::to_string(c.clips.size()) + " clips");
     }
     EXPECT_EQ(log.GetTexts(ANDROID_LOG_WARN).size(), 0u);
 }
 
 // Its three panels: whole, cut by two clips, and turned under a clip that replaced another.
 TEST_P(PenCanvasPixel, TheScenesInkFillsItsPanelsAndNothingElse) {
-    Tool::PenStroke stroke(*queue);
-    Picture const picture = RenderScene(*Scenes::FindScene("pen-stroke"), *queue, &stroke);
-    auto const countInk = [&](Rect const& part) {
+    Tool::PenStroke stroke(*thread);
+    Picture const picture = RenderScene(*Scenes::FindScene("pen-stroke"), *thread, &stroke);
+    auto const countInk = [&](int left, int top, int right, int bottom) {
         int count = 0;
-        for (int i = part.top * picture.width; i < part.bottom * picture.width; ++i) {
-            bool const isInside = i % picture.width >= part.left && i % picture.width < part.right;
-            if (isInside && picture.GetColor(i % picture.width, i / picture.width)[0] < 100) ++count;
-        }
+        for (int y = top; y < bottom; ++y)
+            for (int x = left; x < right; ++x) count += picture.GetColor(x, y)[0] < 100 ? 1 : 0;
         return count;
     };
-    EXPECT_GT(countInk(Rect(10, 10, 150, 130)), 1000);
-    EXPECT_GT(countInk(Rect(190, 40, 290, 90)), 300);
-    EXPECT_GT(countInk(Rect(360, 25, 440, 115)), 300);
-    for (Rect const& outside :
-         {Rect(151, 0, 189, 140), Rect(291, 0, 359, 140), Rect(190, 0, 480, 24), Rect(441, 0, 480, 140)})
-        EXPECT_EQ(countInk(outside), 0);
+    EXPECT_GT(countInk(10, 10, 150, 130), 1000);
+    EXPECT_GT(countInk(190, 40, 290, 90), 300);
+    EXPECT_GT(countInk(360, 25, 440, 115), 300);
+    EXPECT_EQ(countInk(151, 0, 189, 140) + countInk(291, 0, 359, 140) + countInk(190, 0, 480, 24), 0);
     // External code has ended: draws are joined again.
-    queue->Call([this] {
-        auto const next = NewCanvas(*queue, bitmap, UseFrom::RenderThread);
+    thread->Call([this] {
+        auto const next = NewCanvas(*thread, bitmap, UseFrom::RenderThread);
         std::uint64_t const before = RendererFactory::GetStatistics().draws;
         for (float const x : {1.0f, 9.0f}) next->DrawRect(x, 1, x + 5, 5, nullptr);
         RendererFactory::Flush();
@@ -179,51 +187,36 @@ TEST_P(PenCanvasPixel, TheScenesInkFillsItsPanelsAndNothingElse) {
 // Each of these takes another way through the renderer: plain, blended, textured, clipped by the scissor,
 // clipped by the stencil, cleared, uploaded.
 TEST_P(PenCanvasPixel, OwnDrawsBeforeAndAfterAreRightWhateverIsLeftBehind) {
-    Color const white{255, 255, 255, 255};
-    Color const red{255, 0, 0, 255};
-    Picture expected = Paper();
-    BitmapPtr const picture = Create(MakeGradient(6, 5));
     MKPaint paint;
     canvas->DrawRect(2, 2, 30, 8, &paint); // still in the renderer's hands when the pen comes
     DrawInk(RectF(10, 4, 16, 20));
-    FillImage(expected, Rect(2, 2, 30, 8), white);
+    FillImage(expected, Rect(2, 2, 30, 8), kWhite);
     FillImage(expected, Rect(10, 4, 16, 20), kInk);
-
     paint.SetColor(static_cast<int>(0xFFFF0000));
     canvas->DrawRect(14, 6, 20, 12, &paint);
-    FillImage(expected, Rect(14, 6, 20, 12), red);
-    DrawInk(RectF(0, 0, 1, 1));
-    FillImage(expected, Rect(0, 0, 1, 1), kInk);
+    FillImage(expected, Rect(14, 6, 20, 12), kRed);
+    DrawInkAt(0);
     paint.SetColor(1, 1, 1, 0);
     canvas->DrawRect(0, 0, 40, 26, &paint); // blends to nothing, unless blending is wrong
-    DrawInk(RectF(1, 0, 2, 1));
-    FillImage(expected, Rect(1, 0, 2, 1), kInk);
-    MKPaint const plain;
-    canvas->DrawBitmap(picture.Get(), 30, 10, &plain);
-    FillGradient(expected, Rect(30, 10, 36, 15));
-    ExpectSame(expected, Read(), "drawn around ink");
+    DrawInkAt(1);
+    DrawPicture(30, 10, MakeGradient(6, 5));
+    ExpectPicture("drawn around ink");
 
-    DrawInk(RectF(2, 0, 3, 1));
-    FillImage(expected, Rect(2, 0, 3, 1), kInk);
+    DrawInkAt(2);
     canvas->Save(C::SaveClip);
     canvas->SetClipRect(20, 14, 8, 6, C::Intersect);
-    canvas->DrawRect(0, 0, 40, 26, &plain);
-    FillImage(expected, Rect(20, 14, 28, 20), white);
-    DrawInk(RectF(3, 0, 4, 1));
-    FillImage(expected, Rect(3, 0, 4, 1), kInk);
+    canvas->DrawRect(0, 0, 40, 26, nullptr);
+    FillImage(expected, Rect(20, 14, 28, 20), kWhite);
+    DrawInkAt(3);
     canvas->SetClipRect(4, 18, 4, 3, C::Union);
     canvas->Clear(1, 0, 0, 1);
-    FillImage(expected, Rect(20, 14, 28, 20), red);
-    FillImage(expected, Rect(4, 18, 8, 21), red);
+    FillImage(expected, Rect(20, 14, 28, 20), kRed);
+    FillImage(expected, Rect(4, 18, 8, 21), kRed);
     canvas->Restore(-1);
-    ExpectSame(expected, Read(), "clipped around ink");
-
-    DrawInk(RectF(4, 0, 5, 1));
-    FillImage(expected, Rect(4, 0, 5, 1), kInk);
-    BitmapPtr const late = Create(MakeGradient(5, 3));
-    canvas->DrawBitmap(late.Get(), 33, 20, &plain);
-    FillGradient(expected, Rect(33, 20, 38, 23));
-    ExpectSame(expected, Read(), "uploaded after ink");
+    ExpectPicture("clipped around ink");
+    DrawInkAt(4);
+    DrawPicture(33, 20, MakeGradient(5, 3));
+    ExpectPicture("uploaded after ink");
 }
 
 INSTANTIATE_TEST_SUITE_P(Renderer, PenCanvasPixel, ::testing::Values(true, false),

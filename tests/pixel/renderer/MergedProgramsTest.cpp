@@ -4,10 +4,9 @@
 #include "tests/pixel/renderer/ForeignPrograms.h"
 
 #include "moka/base/log/AndroidLog.h"
+#include "tests/support/ImageCompare.h"
 #include "tests/support/LogCapture.h"
 
-#include <cmath>
-#include <cstdlib>
 #include <limits>
 
 namespace Moka::Testing {
@@ -111,13 +110,6 @@ protected:
         return picture;
     }
 
-    static int FindDifference(Picture const& a, Picture const& b) {
-        int largest = 0;
-        for (std::size_t i = 0; i < a.pixels.size(); ++i) {
-            largest = std::max(largest, std::abs(int{a.pixels[i]} - int{b.pixels[i]}));
-        }
-        return largest;
-    }
     static int CountGlPrograms() {
         int count = 0;
         for (GLuint name = 1; name < 200; ++name) count += glIsProgram(name) ? 1 : 0;
@@ -138,7 +130,7 @@ TEST_F(MergedProgramsTest, OnesThatAreUnderstoodDrawTheSameWithOneCall) {
         MakeProgram(texts);
         DrawCells(40);
         EXPECT_EQ(Flush(), 1) << texts.subject;
-        EXPECT_LE(FindDifference(ReadTarget(), expected), 1) << texts.subject;
+        EXPECT_LE(CompareImages(ReadTarget(), expected).largest, 1) << texts.subject;
         EXPECT_EQ(RendererFactory::GetStatistics().errors, 0u) << texts.subject;
     }
 }
@@ -174,7 +166,7 @@ TEST_F(MergedProgramsTest, AFullBlockIsOneCallAndWhatIsLeftAnother) {
         MakeProgram(kWide);
         DrawCells(draws);
         EXPECT_EQ(Flush(), calls) << draws;
-        EXPECT_EQ(FindDifference(ReadTarget(), expected), 0) << draws;
+        EXPECT_EQ(CompareImages(ReadTarget(), expected).largest, 0) << draws;
         EXPECT_EQ(RendererFactory::GetStatistics().runEnds[static_cast<std::size_t>(RunEnd::Full)],
                   static_cast<std::uint64_t>(calls - 1));
     }

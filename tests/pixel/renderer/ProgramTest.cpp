@@ -185,25 +185,6 @@ TEST_F(ProgramTest, SourcesThatDoNotCompileOrLinkMakeAProgramThatDrawsNothing) {
     ForgetDriverErrors();
 }
 
-TEST_F(ProgramTest, ReleaseDeletesTheProgramAndItsHandlesLiveOnInert) {
-    ProgramPtr program = MakeProgram(kVertex, kUniformColor);
-    ProgramPtr idle = MakeProgram(kVertex, kUniformColor);
-    GLuint const idleName = MakeCurrent(idle);
-    GLuint const name = MakeCurrent(program);
-    ParameterPtr const color = Find(program, "color");
-    EXPECT_EQ(RendererFactory::GetStatistics().programs, 2);
-    program.reset();
-    idle.reset();
-    EXPECT_FALSE(glIsProgram(name));
-    EXPECT_FALSE(glIsProgram(idleName));
-    EXPECT_EQ(RendererFactory::GetStatistics().programs, 0);
-    ProgramPtr const next = MakeProgram(kVertex, kUniformColor); // often of the same name
-    next->MakeCurrent();
-    Set(color, Numbers{1, 0, 0, 1});
-    EXPECT_EQ(color->GetType(), BindingTypeVector4);
-    EXPECT_EQ(Draw(), kClear);
-}
-
 TEST_F(ProgramTest, InTheNextContextItIsBuiltAgainWithItsHandlesAndValues) {
     ProgramPtr program = MakeProgram(kVertex, kUniformColor);
     ParameterPtr const color = Find(program, "color");

@@ -159,7 +159,15 @@ private:
     }
 
     void EndTurn() {
-        if (mActive != kNone) Active().real.target->Deactivate(false, false);
+        if (mActive != kNone) {
+            bool const discards = mActive == mHolder && Flip();
+            Active().real.target->Deactivate(false, discards);
+            if (discards) {
+                Active().real.target->DetachDepthStencil();
+                mHolder = kNone;
+                mStencil.clear();
+            }
+        }
         mActive = kNone;
         RendererFactory::Flush();
         ExpectHostsState();
@@ -211,18 +219,18 @@ private:
     }
     static std::vector<GLint> ReadHostsState() {
         std::vector<GLint> state = GetViewport();
-        for (GLenum const name : {GL_DRAW_FRAMEBUFFER_BINDING, GL_READ_FRAMEBUFFER_BINDING,
-                                  GL_VERTEX_ARRAY_BINDING, GL_ARRAY_BUFFER_BINDING, GL_UNIFORM_BUFFER_BINDING,
-                                  GL_CULL_FACE, GL_RASTERIZER_DISCARD, GL_ACTIVE_TEXTURE}) {
-            state.push_back(GetInteger(name));
+        for (int const name : {GL_DRAW_FRAMEBUFFER_BINDING, GL_READ_FRAMEBUFFER_BINDING,
+                               GL_VERTEX_ARRAY_BINDING, GL_ARRAY_BUFFER_BINDING, GL_UNIFORM_BUFFER_BINDING,
+                               GL_CULL_FACE, GL_RASTERIZER_DISCARD, GL_ACTIVE_TEXTURE}) {
+            state.push_back(GetInteger(static_cast<GLenum>(name)));
         }
         return state;
     }
     void ExpectHostsState() const {
         if (mHostsState.empty()) return;
         EXPECT_EQ(ReadHostsState(), mHostsState);
-        for (GLenum unit : {GL_TEXTURE2, GL_TEXTURE1}) {
-            glActiveTexture(unit);
+        for (int const unit : {GL_TEXTURE2, GL_TEXTURE1}) {
+            glActiveTexture(static_cast<GLenum>(unit));
             EXPECT_EQ(GetInteger(GL_SAMPLER_BINDING), 0);
         }
     }

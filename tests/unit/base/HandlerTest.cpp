@@ -1,7 +1,6 @@
 #include "moka/base/Handler.h"
 #include "moka/base/MessageLoop.h"
 
-#include "tests/support/Allocation.h"
 #include "tests/support/Awaited.h"
 #include "tests/support/LogCapture.h"
 
@@ -170,36 +169,6 @@ private:
     Awaited<MessageLoop*> mLoop;
     std::thread mThread;
 };
-
-TEST_F(HandlerTest, EveryThreadsMessagesArriveOnceAndInOrderOnTheLoopsThread) {
-    constexpr int kSenders = 4;
-    constexpr int kMessages = 2000;
-    std::unique_ptr<Receiver> receiver;
-    Awaited<int> arrived;
-    std::atomic<bool> elsewhere{false};
-    LoopThread loop([&] {
-        receiver = std::make_unique<Receiver>([&](Handler*, int) {
-            elsewhere = elsewhere || !MessageLoop::GetCurrent();
-            ++arrived;
-        });
-    });
-    std::vector<std::thread> senders;
-    for (int s = 0; s < kSenders; ++s) {
-        senders.emplace_back([&, s] {
-            for (int i = 0; i < kMessages; ++i) {
-                // Lets the loop fall asleep now and then.
-                if (i % 500 == 0) std::this_thread::sleep_for(std::chrono::milliseconds(1));
-                EXPECT_TRUE((*receiver)->SendMessage(s * kMessages + i));
-            }
-        });
-    }
-    for (std::thread& sender : senders) sender.join();
-    arrived.AwaitAtLeast(kSenders * kMessages);
-    loop.Stop();
-    EXPECT_FALSE(elsewhere);
-    int next[kSenders] = {};
-    for (int const what : receiver->GetReceived()) ASSERT_EQ(what % kMessages, next[what / kMessages]++);
-}
 
 TEST_F(HandlerTest, DestructionElsewhereWaitsForTheRunningMessage) {
     std::unique_ptr<Receiver> receiver;

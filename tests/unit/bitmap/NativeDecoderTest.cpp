@@ -1,4 +1,5 @@
 // Decoding without Java. On its own, because a process does not go back to being without the native decoder.
+#include "moka/base/Bitmap.h"
 #include "moka/graphics/bitmap/ImageDecoding.h"
 #include "tests/support/Allocation.h"
 #include "tests/unit/bitmap/FactoryFixture.h"

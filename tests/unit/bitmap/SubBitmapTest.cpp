@@ -83,46 +83,6 @@ TEST_F(SubBitmap, ReadsAPixelByItsOwnOddBounds) {
     EXPECT_EQ(row, Pixels(pixels.begin() + 12 * 16, pixels.begin() + 13 * 16)) << "rectangles know better";
 }
 
-// Says at once that it has caught up, as every queue does on its own thread.
-class HastyQueue final : public HandPumpedQueue {
-public:
-    void WaitForTasks() override {}
-};
-
-[[gnu::noinline]] unsigned int GetPixelBelow(IMKSubBitmap& strip) {
-    unsigned char volatile above[512] = {};
-    return strip.GetPixel(Point(1, 1)) + above[0];
-}
-
-// Over the frames that have just returned.
-[[gnu::noinline]] bool IsUntouchedWhile(HandPumpedQueue& queue) {
-    unsigned char volatile frame[4096];
-    for (auto& byte : frame) byte = 0xAB;
-    queue.RunAll();
-    bool isUntouched = true;
-    for (auto const& byte : frame) isUntouched = isUntouched && byte == 0xAB;
-    return isUntouched;
-}
-
-TEST_F(SubBitmap, APixelThatIsReadTooLateHarmsNobody) {
-    Pixels const pixels = UniquePixels(4, 4);
-    HastyQueue hasty;
-    RunOnRenderThread(hasty);
-    auto strip = MakeStrip(&hasty, Rect(0, 0, 4, 4), &pixels);
-    hasty.RunAll();
-    EXPECT_EQ(GetPixelBelow(*strip), 0u);
-    EXPECT_TRUE(IsUntouchedWhile(hasty));
-    EXPECT_EQ(CountOf(strip.Get()), 1);
-    strip = {};
-    hasty.RunAll();
-    {
-        HastyQueue dropping; // with the read in it
-        auto lost = MakeStrip(&dropping, Rect(0, 0, 4, 4));
-        EXPECT_EQ(lost->GetPixel(Point(1, 1)), 0u);
-        for (int i = 0; i < 2; ++i) lost->Unref(); // what the dropped tasks leak
-    }
-}
-
 TEST_F(SubBitmap, ProjectionMapsItsRectangleWithRowZeroFirst) {
     Matrix4<float> const m = MakeStrip(&queue, Rect(10, 20, 50, 60))->GetProjectionMatrix();
     EXPECT_EQ(m, Matrix4<float>(0.05f, 0, 0, 0, 0, 0.05f, 0, 0, 0, 0, -1.0f / 32767, 0, -1.5f, -2, -0.0f, 1));

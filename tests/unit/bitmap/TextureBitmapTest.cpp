@@ -49,28 +49,6 @@ TEST_F(TextureBitmap, AnAsynchronousReadCallsBackOnceAfterTheLastStrip) {
     EXPECT_EQ(all, pixels);
 }
 
-// The walk over the strips goes on after the callback.
-TEST_F(TextureBitmap, ACallbackMayDropTheLastReference) {
-    struct Watched : MKTextureBitmap {
-        using MKTextureBitmap::MKTextureBitmap;
-        ~Watched() override { *gone = true; }
-        static void DropIt(Rect const&, void*, void* bitmap) {
-            auto* const self = static_cast<Watched*>(bitmap);
-            bool const* const gone = self->gone;
-            self->Unref();
-            EXPECT_FALSE(*gone);
-        }
-        bool* gone = nullptr;
-    };
-    OnRenderThread const here;
-    Pixels pixels(4 * 2 * kMaxSide * 4);
-    bool gone = false;
-    auto* const bitmap = new Watched(&queue, 4, 2 * kMaxSide, nullptr, false, true, false);
-    bitmap->gone = &gone;
-    bitmap->GetBitmapDataAsync(bitmap->GetBitmapRect(), pixels.data(), bitmap, Watched::DropIt);
-    EXPECT_TRUE(gone);
-}
-
 TEST_F(TextureBitmap, CanvasesHoldItAndItsFrameBuffers) {
     auto const bitmap = NewBitmap(4, 2 * kMaxSide);
     IMKBitmapCanvasAttachable* const attachable = bitmap->GetBitmapCanvasAttachable();

@@ -84,34 +84,6 @@ TEST_F(Drawing, SimpleLinesReachEveryStripAndLogTheirDrawableOnce) {
     EXPECT_EQ(log.Find(line).format, "%s MKLineDrawable Created");
 }
 
-TEST_F(Drawing, ATallBitmapIsDrawnInClampedPiecesAndOneThatTilesWhole) {
-    auto const source = NewBitmap(10, kMaxSide + 16);
-    queue.RunAll();
-    auto const texture = [&](int i) { return StripOf(source, i)->GetTexture(); };
-    // Source rows 32 to 64 go to 0 to 64, which is strip 0; rows 64 to 80 to 64 to 96, strip 1.
-    canvas->DrawBitmap(source.Get(), RectF(0, 32, 10, 80), RectF(0, 0, 20, 96), &paint);
-    std::vector<TracedDraw> const draws = TakeDraws();
-    ASSERT_THAT(draws, SizeIs(2));
-    for (int i = 0; i < 2; ++i) {
-        TracedDraw const& draw = draws[static_cast<std::size_t>(i)];
-        EXPECT_EQ(draw.target, "target " + std::to_string(i + 1));
-        EXPECT_EQ(draw.textures.at(0), RendererTrace::NameOf(texture(i)));
-        EXPECT_EQ(draw.vertices[1], i == 0 ? 0 : 64);
-        EXPECT_EQ(draw.vertices[4], i == 0 ? 0.5f : 0) << "v of row 32 of the first strip, and of row 0";
-        EXPECT_EQ(draw.vertices[5 + 1], i == 0 ? 64 : 96) << "the lower left corner";
-    }
-
-    for (auto const& [x, y] :
-         {std::pair(MKPaint::Default, MKPaint::Mirror), {MKPaint::Mirror, MKPaint::Default}}) {
-        paint.SetTileMode(x, y);
-        canvas->DrawBitmap(source.Get(), RectF(0, 32, 10, 80), RectF(0, 0, 20, 96), &paint);
-        std::vector<TracedDraw> const whole = TakeDraws(); // with strip 0
-        ASSERT_THAT(whole, SizeIs(2));
-        EXPECT_EQ(whole[1].textures.at(0), RendererTrace::NameOf(texture(0)));
-        EXPECT_EQ(whole[1].vertices[4], 0.4f) << "row 32 of 80";
-    }
-}
-
 TEST_F(Drawing, ACustomDrawableIsDrawnOnEveryStripAsFrameBufferMinusOne) {
     FakeDrawable drawable;
     std::vector<std::string> targets;

@@ -35,18 +35,5 @@ TEST(PaintTest, EveryTintSetsTheFlagAndClearingTakesBothAway) {
     EXPECT_TRUE(paint.HasTintColor());
 }
 
-TEST(PaintTest, TwoDashLengthsStandForFourAndOneTileModeForBothAxes) {
-    MKPaint paint;
-    paint.SetDashedLinePattern(Vector2<float>(4, 2));
-    EXPECT_EQ(paint.GetDashedLinePattern(), Color(4, 2, 4, 2));
-    paint.SetDashedLinePattern(Color(1, 2, 3, 4));
-    EXPECT_EQ(paint.GetDashedLinePattern(), Color(1, 2, 3, 4));
-    paint.ClearDashedLinePattern();
-    EXPECT_EQ(paint.GetDashedLinePattern(), Color(-1, -1, -1, -1));
-    paint.SetTileMode(static_cast<MKPaint::TileMode>(2));
-    EXPECT_EQ(paint.GetTileModeX(), MKPaint::Mirror);
-    EXPECT_EQ(paint.GetTileModeY(), MKPaint::Mirror);
-}
-
 } // namespace
 } // namespace Moka::Testing

@@ -134,12 +134,6 @@ ImageInfo GetInfo(std::string const& path) {
     return info;
 }
 
-std::string SaveIn(TempFolder const& folder, Picture const& image, std::string const& extension) {
-    std::string const path = folder.Path("image." + extension);
-    EXPECT_TRUE(SaveImage(image, path)) << path;
-    return path;
-}
-
 Bytes MakeJpeg(Bytes const& pixels, int width, int height, int format, int subsampling, int flags) {
     tjhandle const handle = tjInitCompress();
     unsigned char* encoded = nullptr;

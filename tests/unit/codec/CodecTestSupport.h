@@ -53,8 +53,6 @@ Picture DecodeFile(std::string const& path);
 Picture DecodeScaled(std::string const& path, int width, int height);
 // Fails the test when the factory finds none.
 ImageInfo GetInfo(std::string const& path);
-// As image.EXTENSION; fails the test when it cannot be saved. Returns the path.
-std::string SaveIn(TempFolder const& folder, Picture const& image, std::string const& extension);
 // By libjpeg-turbo, of pixels in one of its formats.
 Bytes MakeJpeg(Bytes const& pixels, int width, int height, int format, int subsampling, int flags = 0);
 // The file's bytes.

@@ -57,17 +57,6 @@ TEST(Mki, ReadsFilesThatItDidNotWrite) {
     EXPECT_EQ(Decode(MakeMki({1, 1, 1, 0}, invalid.pixels)), invalid) << "pixels are taken as they are";
 }
 
-TEST(Mki, WritesTheHeaderAndOneChecksummedFrame) {
-    Picture const image = MakeTranslucentNoise(700, 301);
-    Bytes const file = Encode(image, "mki");
-    Bytes const payload(file.begin() + 32, file.end());
-    EXPECT_EQ(file, MakeMki({700, 301}, payload));
-    Bytes content(image.pixels.size());
-    ZSTD_decompress(content.data(), content.size(), payload.data(), payload.size());
-    EXPECT_EQ(content, image.pixels);
-    EXPECT_TRUE(payload[4] & 4) << "the content checksum is off";
-}
-
 TEST(Mki, RefusesWhateverDoesNotAddUp) {
     Bytes const pixels = MakeTranslucentNoise(3, 2).pixels;
     Bytes const frame = Compress(pixels);

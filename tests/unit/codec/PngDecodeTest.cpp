@@ -47,18 +47,8 @@ void WritePalette(png_structp png, png_infop info, PngKind const& kind, std::mt1
     if (kind.hasTransparency) png_set_tRNS(png, info, alphas, 1 << kind.depth, nullptr);
 }
 
-// Chunks that must not change a pixel.
-void WriteNeedless(png_structp png, png_infop info) {
-    std::string key("Comment"), words(100000, 'x');
-    png_text text = {};
-    text.compression = PNG_TEXT_COMPRESSION_zTXt;
-    text.key = key.data();
-    text.text = words.data();
-    png_set_text(png, info, &text, 1);
-}
-
 // Of random samples, whatever they mean, many of them zero; the transparent colour, if any, is zero.
-Bytes MakePng(PngKind const& kind, int width, int height, bool hasNeedless = false) {
+Bytes MakePng(PngKind const& kind, int width, int height) {
     std::mt19937 random(static_cast<unsigned>(kind.colourType * 100 + kind.depth));
     Bytes bytes;
     png_structp png = png_create_write_struct(PNG_LIBPNG_VER_STRING, nullptr, nullptr, nullptr);
@@ -72,7 +62,6 @@ Bytes MakePng(PngKind const& kind, int width, int height, bool hasNeedless = fal
         WritePalette(png, info, kind, random);
     else if (kind.hasTransparency)
         png_set_tRNS(png, info, nullptr, 0, &zero);
-    if (hasNeedless) WriteNeedless(png, info);
     std::vector<Bytes> rows(static_cast<std::size_t>(height), Bytes(png_get_rowbytes(png, info)));
     std::vector<png_bytep> pointers;
     for (Bytes& row : rows) {
@@ -112,13 +101,13 @@ TEST(PngDecode, EveryColourTypeDepthAndInterlacingBecomesItsExactPixels) {
                                               << " tRNS " << kind.hasTransparency << " side " << side);
             kind.isInterlaced = false;
             Picture const expected = ReadSimply(MakePng(kind, side, 21 - side));
-            WriteBytes(path, MakePng(kind, side, 21 - side, true));
+            WriteBytes(path, MakePng(kind, side, 21 - side));
             EXPECT_EQ(GetInfo(path).hasAlpha,
                       kind.hasTransparency || (kind.colourType & PNG_COLOR_MASK_ALPHA) != 0);
             EXPECT_TRUE(DecodeFile(path) == expected);
             Picture const scaled = DecodeScaled(path, 13, 5);
             kind.isInterlaced = true;
-            WriteBytes(path, MakePng(kind, side, 21 - side, true));
+            WriteBytes(path, MakePng(kind, side, 21 - side));
             EXPECT_TRUE(DecodeFile(path) == expected);
             EXPECT_TRUE(DecodeScaled(path, 13, 5) == scaled);
         }

@@ -2,7 +2,6 @@
 #include "moka/base/String.h"
 #include "tests/unit/codec/CodecTestSupport.h"
 
-#include <filesystem>
 #include <fstream>
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
@@ -95,22 +94,6 @@ TEST(Save, ANewFileObeysTheMaskAndAReplacedOneKeepsItsModeAndItsReaders) {
     EXPECT_EQ(DecodeFile(folder.Path("old.png")), image);
     EXPECT_EQ(Bytes(std::istreambuf_iterator<char>(reader), {}), kOld);
     EXPECT_THAT(folder.List(), ElementsAre("new.png", "old.png"));
-}
-
-TEST(Save, GoesThroughSymbolicLinksToTheFileBehind) {
-    TempFolder const folder;
-    Picture const image = MakeOpaqueNoise(5, 5);
-    ASSERT_EQ(mkdir(folder.Path("album").c_str(), 0700), 0);
-    WriteBytes(folder.Path("album/real"), kOld);
-    ASSERT_EQ(symlink("album/real", folder.Path("link.png").c_str()), 0);
-    ASSERT_EQ(symlink("link.png", folder.Path("chain.png").c_str()), 0);
-    ASSERT_EQ(symlink("album/made", folder.Path("dangling.png").c_str()), 0);
-    for (char const* name : {"chain.png", "dangling.png"}) {
-        EXPECT_TRUE(SaveImage(image, folder.Path(name))) << name;
-        EXPECT_TRUE(std::filesystem::is_symlink(folder.Path(name))) << name;
-    }
-    EXPECT_EQ(DecodeFile(folder.Path("album/real")), image);
-    EXPECT_EQ(DecodeFile(folder.Path("album/made")), image);
 }
 
 } // namespace

@@ -66,7 +66,8 @@ TEST(ScaledDecode, EveryFormatHasTheExactSizeAndTheScalersPixelsOrClose) {
         int tolerance;
     } const cases[] = {{"png", noise, 0}, {"mki", noise, 0}, {"jpg", smooth, 8}, {"webp", smooth, 2}};
     for (auto const& [extension, image, tolerance] : cases) {
-        std::string const path = SaveIn(folder, image, extension);
+        std::string const path = folder.Path(std::string("image.") + extension);
+        EXPECT_TRUE(SaveImage(image, path)) << path;
         for (auto const& [width, height] : kSizes) {
             EXPECT_LE(LargestDifference(DecodeScaled(path, width, height), Scale(image, width, height)),
                       tolerance)

@@ -20,20 +20,6 @@ MOKA_SHADER_CLASS(WrongShader, WRONG_UNIFORMS)
 MOKA_SHADER_DEFINITION(WrongShader, WRONG_UNIFORMS, "uniform mat4 first; uniform int wrong;",
                        "uniform int after;")
 
-#define EVERY_KIND_UNIFORMS(U)                                                                               \
-    U(Bool, flag)                                                                                            \
-    U(Matrix4, matrix)                                                                                       \
-    U(Vector2, pair)                                                                                         \
-    U(Vector4, color)                                                                                        \
-    U(Float, number)                                                                                         \
-    U(Int, count)                                                                                            \
-    U(TextureUnit, texture)                                                                                  \
-    U(Vector4, missing)
-MOKA_SHADER_CLASS(EveryKindShader, EVERY_KIND_UNIFORMS)
-MOKA_SHADER_DEFINITION(EveryKindShader, EVERY_KIND_UNIFORMS, "uniform mat4 matrix; attribute vec4 missing;",
-                       "uniform bool flag; uniform vec2 pair; uniform vec4 color; uniform float number;"
-                       "uniform int count; uniform sampler2D texture;")
-
 namespace {
 
 using ::testing::ElementsAre;
@@ -129,43 +115,6 @@ TEST_F(ShaderManagerTest, AWrongTypeStopsTheConstructionAndLeavesNoEntry) {
     expectedAlive += 2;
 }
 
-TEST_F(ShaderManagerTest, AssignedValuesReachTheProgramAndMissingUniformsSwallowThem) {
-    {
-        RendererTrace::TakeCalls();
-        EveryKindShader shader;
-        std::string const get = "program 1 GetParameter ";
-        EXPECT_THAT(RendererTrace::TakeCalls(),
-                    ElementsAre("program 1 Create EveryKindShader", get + "flag 1", get + "matrix 2",
-                                get + "pair 3", get + "color 5", get + "number 6", get + "count 7",
-                                get + "texture 8", get + "missing 0"));
-        shader.program->MakeCurrent();
-        shader.flag = true;
-        shader.matrix = Matrix4<float>(1, 2, 3, 4, 5, 6, 7, 8, 9, 10, 11, 12, 13, 14, 15, 16);
-        shader.pair = Vector2<float>(0.5f, -1);
-        shader.color = Vector4<float>(1, 0.25f, 0, 1);
-        shader.number = 2.5f;
-        shader.count = -3;
-        (shader.texture = 1) = 2; // the assignment gives the binding back
-        shader.missing = Vector4<float>();
-        auto const value = [&](char const* name) {
-            return RendererTrace::GetParameter(shader.program, name);
-        };
-        EXPECT_EQ(value("flag"), "1");
-        EXPECT_EQ(value("matrix"), "1 2 3 4 5 6 7 8 9 10 11 12 13 14 15 16");
-        EXPECT_EQ(value("pair"), "0.5 -1");
-        EXPECT_EQ(value("color"), "1 0.25 0 1");
-        EXPECT_EQ(value("number"), "2.5");
-        EXPECT_EQ(value("count"), "-3");
-        EXPECT_EQ(value("texture"), "2");
-        EXPECT_EQ(RendererTrace::CountCalls("SetParameter"), 9);
-        RendererTrace::TakeCalls();
-    }
-    std::vector<std::string> const calls = RendererTrace::TakeCalls(); // backwards
-    EXPECT_EQ(calls.front(), "program 1 Release");
-    EXPECT_EQ(calls.back(), "program 1 ReleaseParameter flag");
-    EXPECT_THAT(log.GetTexts(), IsEmpty());
-}
-
 // Where a mediump float has 16 bits a place above 1024 is known to a whole unit, and a wide bitmap skips texels.
 TEST(ShaderPrecision, WhatIsInterpolatedIsOfHighPrecisionInEveryFragmentStage) {
     int varyings = 0;
@@ -182,6 +131,20 @@ TEST(ShaderPrecision, WhatIsInterpolatedIsOfHighPrecisionInEveryFragmentStage) {
         }
     }
     EXPECT_EQ(varyings, 15);
+}
+
+struct NoMemoryShader {
+    NoMemoryShader() { ADD_FAILURE() << "constructed in no memory"; }
+    static void* operator new(std::size_t, std::nothrow_t const&) noexcept { return nullptr; }
+    static void operator delete(void* memory) { ::operator delete(memory); }
+};
+
+TEST_F(ShaderManagerTest, WithoutMemoryTheEntryIsThereAndTheShaderIsNull) {
+    EXPECT_EQ(manager.GetShader<NoMemoryShader>(), nullptr);
+    log.Clear();
+    EXPECT_EQ(manager.GetShader<NoMemoryShader>(), nullptr);
+    EXPECT_THAT(log.GetTexts(), IsEmpty());
+    manager.RemoveShader(ShaderManager::Key(typeid(NoMemoryShader).name()));
 }
 
 struct SlowShader {

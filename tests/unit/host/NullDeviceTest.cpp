@@ -70,13 +70,5 @@ TEST(NullDevice, ImagesOfManyThreadsAreRealAndDrawsAreCounted) {
     EXPECT_EQ(statistics.errors, 0u);
 }
 
-TEST(NullDevice, AWindowIsRefusedWithTheReason) {
-    RenderThreadOptions options;
-    options.nativeWindow = 1;
-    std::string error;
-    EXPECT_FALSE(RenderThread::Start(options, &error));
-    EXPECT_NE(error.find("nativeWindow"), std::string::npos) << error;
-}
-
 } // namespace
 } // namespace Moka::Testing

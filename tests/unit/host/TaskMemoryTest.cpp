@@ -95,34 +95,5 @@ TEST(TaskMemoryTest, AOneWayStreamReusesItsBlocks) {
 }
 #endif
 
-// Uses the pool when its thread's own cache is gone already: what is built before it is destroyed after it.
-struct LateUser {
-    ~LateUser() {
-        if (!seen) return;
-        Block const first = Block::Make(300, 1);
-        Block const second = Block::Make(300, 2);
-        EXPECT_TRUE(first.memory && second.memory && first.IsIntact() && second.IsIntact());
-        seen->insert({first.memory, second.memory});
-        first.Free();
-        second.Free();
-    }
-    std::set<void*>* seen = nullptr;
-};
-thread_local LateUser tLateUser;
-
-TEST(TaskMemoryTest, AThreadThatIsBeingTornDownGetsBlocksAndGivesThemBack) {
-    std::set<void*> seen;
-    for (int round = 0; round < 100; ++round) {
-        std::thread([&seen] {
-            tLateUser.seen = &seen;
-            FreeTask(AllocateTask(300), 300);
-        }).join();
-    }
-    ASSERT_FALSE(seen.empty());
-#if !defined(__SANITIZE_ADDRESS__)
-    EXPECT_LE(seen.size(), 2u * detail::kTaskBatch);
-#endif
-}
-
 } // namespace
 } // namespace Moka::Testing

@@ -184,31 +184,5 @@ TEST_F(TaskQueueTest, GoesOnAfterAnExceptionAndAWaitInsideATask) {
                 ElementsAre(HasSubstr("out of paper"), HasSubstr("threw"), HasSubstr("WaitForTasks")));
 }
 
-// A task that posts and waits when it dies, as one that owns a bitmap may.
-class TalkativeTask final : public ITask {
-public:
-    explicit TalkativeTask(TaskQueue& queue) : mQueue(queue) {}
-    ~TalkativeTask() override {
-        ITask* const task = MakeTask([] {});
-        if (!mQueue.Post(task)) delete task;
-        mQueue.WaitForTasks();
-    }
-    void run() override {}
-
-private:
-    TaskQueue& mQueue;
-};
-
-TEST_F(TaskQueueTest, HoldsNoLockWhileATaskIsFreed) {
-    {
-        QueueThread queue;
-        queue.Start();
-        queue.Post(new (std::nothrow) TalkativeTask(queue));
-        queue.Stop();
-    }
-    QueueThread neverRun;
-    neverRun.Post(new (std::nothrow) TalkativeTask(neverRun));
-}
-
 } // namespace
 } // namespace Moka::Testing

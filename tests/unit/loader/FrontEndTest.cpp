@@ -102,33 +102,6 @@ TYPED_TEST(EitherFrontEnd, DestroyedWhileCallingItWaitsForTheCall) {
     destroyer.join();
 }
 
-TYPED_TEST(EitherFrontEnd, ACallbackMayRequestCancelAndDestroyOthers) {
-    String const path = this->WritePicture("a.mki");
-    auto callback = MakeCallback<TypeParam>(this->listener);
-    TypeParam loader("pad", &callback);
-    auto other = std::make_unique<TypeParam>("other", &callback);
-    Awaited<bool> done;
-    auto busy = MakeCallback<TypeParam>(this->listener);
-    busy.onLoadError = [&](int, String const&) {
-        other.reset();
-        loader.CancelLoadRequest(1);
-        EXPECT_TRUE(loader.RequestLoad(1, path, nullptr, 2, 2));
-        EXPECT_TRUE(loader.RequestSave(3, this->Path("s.png"), new unsigned char[4](), 1, 1, nullptr, 100));
-        loader.CancelAllLoadRequest();
-        done.Set(true);
-    };
-    TypeParam acting("acting", &busy);
-    CodecGate gate;
-    acting.RequestLoad(0, this->Path("missing.mki"), this->queue.get());
-    loader.RequestLoad(1, path, this->queue.get());
-    other->RequestLoad(2, path, this->queue.get());
-    gate.Open();
-    done.AwaitAtLeast(true);
-    this->AwaitAll();
-    EXPECT_EQ(this->listener.GetEvents(), Events{"save 3"});
-    loader.WaitForCallback();
-}
-
 TEST_F(FrontEnd, TheTwoKindsShareOneQueueAndOneThread) {
     auto onGpu = MakeCallback<MKBitmapLoader>(listener);
     auto onCpu = MakeCallback<BitmapLoader>(listener);

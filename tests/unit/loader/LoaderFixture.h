@@ -86,12 +86,6 @@ protected:
             return last == lines.rend() || last->text == "BitmapLoaderImpl::EventLoop Wait!";
         });
     }
-    std::vector<std::string> LinesOf(std::string const& tag) const {
-        std::vector<std::string> texts;
-        for (LogLine const& line : log.GetLines())
-            if (line.tag == tag) texts.push_back(line.text);
-        return texts;
-    }
 
     TempFolder folder;
     LogCapture log;

@@ -2,9 +2,12 @@
 // come to its end, with no crash and no leak that a sanitizer would report.
 #include "moka/base/Bitmap.h"
 #include "moka/graphics/bitmap/ImageDecoding.h"
+#include "moka/graphics/factory/MKGraphicsFactory.h"
 #include "moka/graphics/loader/BitmapLoader.h"
 #include "moka/graphics/loader/MKBitmapLoader.h"
+#include "moka/renderer/RendererFactory.h"
 #include "tests/support/LogCapture.h"
+#include "tests/support/Queues.h"
 #include "tests/support/TestFiles.h"
 #include "tests/unit/loader/CodecGate.h"
 
@@ -102,22 +105,19 @@ TEST_F(ProcessExit, InTheMiddleOfAFileWithMoreQueued) {
     });
 }
 
-#if defined(MOKA_CHECKS) && MOKA_CHECKS
-TEST_F(ProcessExit, AFrontEndDestroyedInItsOwnCallbackIsFoundInDebugBuilds) {
-    EXPECT_DEATH(
-        {
-            std::unique_ptr<MKBitmapLoader> loader;
-            MKBitmapLoader::Callback callback;
-            callback.onLoadError = [&](int, String const&) { loader.reset(); };
-            loader = std::make_unique<MKBitmapLoader>("pad", &callback);
-            MKBitmapLoader::startEventLoopBySelf();
-            loader->RequestLoad(1, "missing.mki", nullptr);
-            MKBitmapLoader::WaitForAllSaveRequestsToEnd(nullptr);
-            MKBitmapLoader::WaitUntilMsgQueueRequired();
-        },
-        "a callback waits for itself");
+TEST_F(ProcessExit, WithAReadBackThatTheQueueRefused) {
+    ExpectCleanExit([] {
+        static bool refuse = false;
+        static RefusingQueue queue(RefusingQueue::Predicate([](int, ITask*) { return refuse; }));
+        RendererFactory::AttachContext();
+        MKBitmapLoader::startEventLoopBySelf();
+        static IMKBitmap* const bitmap =
+            MKGraphicsFactory::CreateBitmap(&queue, 4, 4, nullptr, false, 1, false);
+        refuse = true;
+        MKBitmapLoader loader("pad", nullptr);
+        EXPECT_TRUE(loader.RequestSave(1, "s.png", *bitmap, nullptr, 100));
+    });
 }
-#endif
 
 } // namespace
 } // namespace Moka::Testing

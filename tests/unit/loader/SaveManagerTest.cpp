@@ -2,10 +2,7 @@
 #include "moka/graphics/loader/MKBitmapSaveManager.h"
 
 #include "moka/base/MessageLoop.h"
-#include "tests/support/Queues.h"
 #include "tests/unit/loader/LoaderFixture.h"
-
-#include <stdexcept>
 
 namespace Moka::Testing {
 namespace {
@@ -33,7 +30,6 @@ protected:
         results.push_back(what + std::filesystem::path(path.ToUtf8()).filename().string());
         lastUserData = userData;
         lastThread = std::this_thread::get_id();
-        if (whenNoted) whenNoted();
     }
     Callback MakeCallback(void* userData = nullptr) { return {Succeeded, Failed, this, userData}; }
     bool Request(MKBitmapSaveManager& manager, std::string const& name, Callback* callback) {
@@ -50,7 +46,6 @@ protected:
     Events results;
     void* lastUserData = nullptr;
     std::thread::id lastThread;
-    std::function<void()> whenNoted;
     MessageLoop messages;
 };
 
@@ -73,13 +68,7 @@ TEST_F(SaveManager, TwoResultsShareOneMessageAndComeInOrder) {
     EXPECT_TRUE(SaveImage(image, folder.Path("direct.png")));
     EXPECT_EQ(ReadBytes("a.png"), ReadBytes("direct.png"));
     EXPECT_EQ(messages.RunPending(), 0);
-    for (char const* rest : {"RequestSave mSaveCount(1)", "RequestSave mSaveCount(2)",
-                             "sm_OnSave mSaveCount(2) hasError(0)", "sm_OnSave mSaveCount(2) hasError(1)",
-                             "sm_HandleMessage mSaveCount(1)", "sm_HandleMessage mSaveCount(0)"}) {
-        LogLine const line = log.Find(std::string("SaveManager::") + rest);
-        EXPECT_EQ(line.priority, ANDROID_LOG_INFO) << rest;
-        EXPECT_EQ(line.tag, "mok_log") << rest;
-    }
+    EXPECT_EQ(log.Find("SaveManager::sm_OnSave mSaveCount(2) hasError(1)").tag, "mok_log");
 }
 
 TEST_F(SaveManager, WaitingHandsResultsOverOnTheWaitingThread) {
@@ -103,21 +92,14 @@ TEST_F(SaveManager, WaitingHandsResultsOverOnTheWaitingThread) {
     EXPECT_EQ(results.size(), 2u);
 }
 
-TEST_F(SaveManager, ACallbackMayRequestAnotherSaveAndThrow) {
+TEST_F(SaveManager, ARefusedRequestStaysCounted) {
     MKBitmapSaveManager manager;
     Callback callback = MakeCallback();
-    int left = 2;
-    whenNoted = [&] {
-        if (left-- > 0) {
-            EXPECT_TRUE(Request(manager, "again" + std::to_string(left) + ".png", &callback));
-        }
-        throw std::runtime_error("no");
-    };
-    Request(manager, "a.png", &callback);
-    Request(manager, "b.png", &callback);
-    manager.WaitForSaveCompleting(queue.get());
-    EXPECT_EQ(results, (Events{"saved a.png", "saved b.png", "saved again1.png", "saved again0.png"}));
-    EXPECT_EQ(log.Count(ANDROID_LOG_ERROR, "threw: no"), 4);
+    auto const empty = RefPtr<IMKBitmap>::Adopt(
+        MKGraphicsFactory::CreateBitmap(queue.get(), reinterpret_cast<TextureObject const*>(this), 1));
+    EXPECT_FALSE(manager.RequestSave(1, Path("a.png"), *empty, &callback, 100));
+    EXPECT_EQ(manager.GetRequestSaveCount(), 1);
+    EXPECT_EQ(results, Events{});
 }
 
 TEST_F(SaveManager, DestroyedWithSavesAndResultsItLeavesTheFilesAndCallsNobody) {

@@ -131,12 +131,5 @@ TEST_F(Save, ARemovedCallbackLeavesTheFile) {
     EXPECT_EQ(other.GetEvents(), (Events{"pending", "save 4", "completed"}));
 }
 
-TEST_F(Save, ALoadQueuedBehindASaveReadsWhatItWrote) {
-    Request(1, "s.mki");
-    Loader().RequestLoad(&listener, 2, Path("s.mki"), detail::BITMAP_TYPE_CPU, queue.get(), 0, 0);
-    listener.AwaitCompleted(2);
-    EXPECT_EQ(listener.GetResults(), (Events{"save 1", "load 2 40x30"}));
-}
-
 } // namespace
 } // namespace Moka::Testing

@@ -44,24 +44,17 @@ TEST(GlslVariantTest, TextThatIsNotUnderstoodIsRefusedWithItsReason) {
         {"uniform vec4 color = vec4(1.0);\n", "declared with ="},
         {"uniform Block { vec4 a; };\n", "of type Block"},
         {"uniform vec3 tint;\n", "of type vec3"},
-        {"uniform\n", "of type uniform"},
         {"layout(location = 1) uniform vec4 tint;\n", "qualifier"},
-        {"highp uniform vec4 tint;\n", "qualifier"},
         {"int n = gl_VertexID;\n", "gl_VertexID"},
-        {"int n = gl_InstanceID;\n", "gl_InstanceID"},
         {"void f() { gl_FragData[0] = vec4(0.0); }\n", "gl_FragData"},
         {"float mokaNumber;\n", "mokaNumber"},
-        {"float MokaRecords;\n", "MokaRecords"},
         {"#extension GL_OES_standard_derivatives : enable\n", "extension"},
         {"#define IN uniform\n", "directive contains uniform"},
         {"#define entry main\n", "directive contains main"},
-        {"#define moka 1\n", "directive contains moka"},
         {"#if __VERSION__ > 100\n#endif\n", "directive contains __VERSION__"},
         {"#define LONG \\\n 1.0\n", "next line"},
         {"#ifdef A\nuniform vec4 tint;\n#endif\n", "condition contains uniform"},
-        {"#if 1\nvarying vec2 at;\n#endif\n", "condition contains varying"},
         {"#endif\n", "not closed"},
-        {"void f() {\n", "not closed"},
     };
     for (auto const& [before, reason] : cases) {
         std::string const found = FindReason(kVertex, before + kFragment);
@@ -75,20 +68,6 @@ TEST(GlslVariantTest, TextThatIsNotUnderstoodIsRefusedWithItsReason) {
     std::string const modern = "#version 300 es\n#extension GL_OES_any : warn\nuniform mediump vec4 color;"
                                "out mediump vec4 c; void main() { c = color; }";
     EXPECT_EQ(FindReason("#version 300 es\nvoid main() {}", modern), "");
-}
-
-TEST(GlslVariantTest, StagesMayShareAsManyVectorsAsEveryDeviceHas) {
-    for (int const own : {10, 11}) {
-        ProgramLayout layout;
-        layout.Add("matrix", BindingTypeMatrix4);
-        layout.Add("color", BindingTypeVector4);
-        std::string const last = own == 10 ? "at9" : "at9, at10";
-        std::string const vertex =
-            "varying mat2 m; varying vec4 at2, at3, at4, at5, at6, at7, at8, " + last + ";\n" + kVertex;
-        std::string const found =
-            FindReason(vertex, std::string("uniform mat4 matrix;\n") + kFragment, layout);
-        EXPECT_EQ(found, own == 10 ? "" : "it would need 16 varyings");
-    }
 }
 
 TEST(GlslVariantTest, UniformsTooLargeForABlockAreRefused) {

@@ -332,7 +332,7 @@ TEST(SceneFormat, BitmapsAreCountedBeforeTheirPixelsAreMade) {
     };
     char const* const expected =
         "bad.json:3:9: bitmaps.last: all bitmaps of a scene together may have 67108864 pixels";
-    EXPECT_THAT(FindError(with(64, "0")), HasSubstr("may have 64 bitmaps"));
+    EXPECT_THAT(FindError(with(1024, "0")), HasSubstr("may have 1024 bitmaps"));
     EXPECT_EQ(FindError(with(4, R"({"picture": "disc", "width": 1, "height": 1})")), expected);
     TempFolder const folder;
     ASSERT_TRUE(SaveImage(MakeGradient(2, 2), folder.Path("a.png")));

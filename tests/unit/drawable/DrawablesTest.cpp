@@ -1,16 +1,71 @@
-// Bitmaps: what the pictures do not show.
+// Primitives and bitmaps: what the pictures do not show.
 #include "moka/graphics/bitmap/IMKBitmapReadable.h"
 #include "moka/graphics/drawable/MKBitmapDrawable.h"
+#include "moka/graphics/drawable/MKCircleDrawable.h"
+#include "moka/graphics/drawable/MKLineDrawable.h"
+#include "moka/graphics/drawable/MKRectDrawable.h"
+#include "moka/graphics/drawable/MKRoundRectDrawable.h"
 #include "moka/graphics/factory/MKGraphicsFactory.h"
 #include "tests/support/Queues.h"
 #include "tests/unit/drawable/DrawableFixture.h"
 
+#include <functional>
+#include <memory>
 #include <optional>
 
 namespace Moka::Testing {
 namespace {
 
 using ::testing::ElementsAre;
+using ::testing::SizeIs;
+
+TEST_F(DrawableFixture, EveryDrawAppliesThePaintAndItsOwnStatesAndThinLinesLeaveTheirPoints) {
+    MKRectDrawable rect;
+    MKRoundRectDrawable roundRect;
+    MKCircleDrawable circle;
+    MKLineDrawable line;
+    MKPaint paint = CommonPaint();
+    paint.SetStyle(MKPaint::FillAndStroke);
+    paint.SetLineWidth(2);
+    auto const draw = [&] {
+        RectF const r(2, 2, 12, 12);
+        PointF const from(2, 2);
+        PointF const to(12, 12);
+        std::function<void()> const requests[] = {
+            [&] { rect.DrawRectRT(r, projection, paint); },
+            [&] { roundRect.DrawRoundRectRT(r, 3, 3, projection, paint); },
+            [&] { circle.DrawCircleRT(from, 3, projection, paint); },
+            [&] { line.DrawLineRT(from, to, projection, paint); },
+            [&] { line.DrawSimpleLineRT(from, to, projection, paint); },
+            [&] {
+                line.DrawSimpleLinesRT(new std::vector<PointF>{from, to}, projection, paint);
+            },
+        };
+        for (auto const& request : requests) {
+            ForceOtherStates(); // each on states that another one has left
+            request();
+        }
+        std::vector<TracedDraw> draws = TakeDraws();
+        EXPECT_THAT(draws, SizeIs(1 + 4 + 2 + 3));
+        return draws;
+    };
+    for (TracedDraw const& each : draw()) {
+        ExpectCommonState(each);
+        EXPECT_FALSE(each.state.depthStencil.IsStencil() || each.state.depthStencil.IsDepth());
+    }
+    paint.ClearTintColor();
+    for (TracedDraw const& each : draw()) EXPECT_EQ(Values(each, {"uHasTintColor"}), "0");
+    paint.SetXFermode(static_cast<MKPaint::XFermode>(19)); // any other number is source over
+    for (TracedDraw const& each : draw())
+        EXPECT_EQ(each.state.blend.GetColorEquation().destination, BlendingFactor::OneMinusSrcAlpha);
+    auto const points = std::make_unique<std::vector<PointF>>(4);
+    MKPaint thin;
+    thin.SetLineWidth(0.9f);
+    line.DrawSimpleLinesRT(points.get(), projection, thin); // they stay ours
+    paint.SetXFermode(MKPaint::BlendingOff);
+    rect.DrawRectRT(RectF(2, 2, 12, 12), projection, paint);
+    EXPECT_FALSE(TakeDraw().state.blend.IsBlending());
+}
 
 class BitmapDrawableTest : public DrawableFixture {
 protected:
