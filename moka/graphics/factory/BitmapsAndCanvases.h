@@ -128,7 +128,7 @@ inline std::unique_ptr<Bitmap> ReadBitmap(IMKBitmap& bitmap) {
     // The reading has no result. A pixel that is read into its opposite and stays that has not been read.
     unsigned char opposite[4];
     unsigned char probe[4];
-    for (int i = 0; i < 4; ++i) opposite[i] = probe[i] = static_cast<unsigned char>(~pixels[i]);
+    for (std::size_t i = 0; i < 4; ++i) opposite[i] = probe[i] = static_cast<unsigned char>(~pixels[i]);
     Rect const all = bitmap.GetBitmapRect();
     bitmap.GetBitmapData(Rect(all.left, all.top, all.left + 1, all.top + 1), probe);
     if (std::equal(probe, probe + 4, opposite)) return nullptr;
