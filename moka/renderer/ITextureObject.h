@@ -45,7 +45,7 @@ public:
     virtual int GetWidth() const = 0;
     virtual int GetHeight() const = 0;
 
-    // Its value for this view; -1 for an unknown one.
+    /// Its value for this view; -1 for an unknown one.
     virtual int GetParameter(int id) const = 0;
 };
 

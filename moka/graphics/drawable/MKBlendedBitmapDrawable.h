@@ -29,6 +29,7 @@ public:
     void SetRects(RectF const& src, RectF const& dst);
     void SetSize(float width, float height);
 
+    /// The values set; no new reference.
     IMKBitmap* GetBitmapFirst() const { return mBitmap.Get(); }
     IMKBitmap* GetBitmapSecond() const { return mSecondBitmap.Get(); }
     RectF const& GetSrc() const { return mSrc; }

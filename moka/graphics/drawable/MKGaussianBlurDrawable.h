@@ -31,6 +31,7 @@ public:
     /// Shifts the content, not the rectangle it is drawn into. The paint's tile mode fills the edges.
     void SetOffset(float x, float y) { mOffset = {x, y}; }
 
+    /// The values set; no new reference.
     IMKBitmap* GetBitmap() const { return mBitmap.Get(); }
     bool IsHorizontal() const { return mHorizontal; }
     float GetBlurAmount() const { return mAmount; }

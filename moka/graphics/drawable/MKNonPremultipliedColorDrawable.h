@@ -20,6 +20,7 @@ public:
     /// src over dst; takes a reference on each.
     void SetBitmap(IMKBitmap* src, IMKBitmap* dst);
 
+    /// The bitmaps set; no new reference.
     IMKBitmap* GetSrc() const { return mBitmap.Get(); }
     IMKBitmap* GetDst() const { return mSecondBitmap.Get(); }
 

@@ -56,7 +56,7 @@ public:
     /// the canvas does not cull custom drawables. Soft edges reach a device pixel farther.
     RectF GetBounds() const { return mBounds; }
 
-    // All points that were appended and kept. Waits for the render thread, which has them.
+    /// All points that were appended and kept. Waits for the render thread, which has them.
     std::vector<MKStrokePoint> ReadPoints();
 
     void DrawRT(Matrix4<float> const& projection, MKPaint const& paint) override;

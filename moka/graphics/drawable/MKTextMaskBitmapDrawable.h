@@ -24,6 +24,7 @@ public:
     /// Of the mask's upper left corner; the origin unless set.
     void SetDstPosition(float x, float y) { mPosition = {x, y}; }
 
+    /// The values set; no new reference.
     IMKBitmap* GetBitmap() const { return mBitmap.Get(); }
     PointF const& GetDstPosition() const { return mPosition; }
 
