@@ -15,6 +15,9 @@ set(CPACK_COMPONENTS_ALL MokaRuntime MokaDevelopment MokaTool)
 if(TARGET moka_java_sdk)
   list(APPEND CPACK_COMPONENTS_ALL MokaJava)
 endif()
+if(TARGET moka_notebook)
+  list(APPEND CPACK_COMPONENTS_ALL MokaNotebook)
+endif()
 
 set(CPACK_DEBIAN_PACKAGE_SHLIBDEPS ON)
 set(CPACK_DEBIAN_PACKAGE_GENERATE_SHLIBS ON)
@@ -50,6 +53,10 @@ moka_package(MokaJava libmokagraphics-java java "${exactly}"
   "2D GPU graphics library, Java classes"
   "The classes that libMokaGraphics registers its natives with, for Java programs"
   "that load it.")
+moka_package(MokaNotebook moka-notebook graphics "${exactly}"
+  "notebook page to write on with a pen, a finger or the mouse"
+  "Pens, a highlighter, erasers, a lasso and images on a page as long as it is"
+  "written, drawn on the GPU by libMokaGraphics and kept as a scene in JSON.")
 set(CPACK_DEBIAN_MOKARUNTIME_PACKAGE_RECOMMENDS "libegl-mesa0, libgl1-mesa-dri")
 set(CPACK_DEBIAN_MOKADEVELOPMENT_PACKAGE_RECOMMENDS "cmake (>= 3.23), pkg-config")
 set(CPACK_DEBIAN_MOKAJAVA_PACKAGE_RECOMMENDS "default-jre-headless")

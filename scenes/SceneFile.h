@@ -15,7 +15,7 @@ namespace Moka::Scenes {
 // Files and pictures made by rule alike.
 constexpr std::size_t kMaxBitmaps = 1024;
 constexpr std::int64_t kMaxPicturePixels = std::int64_t{64} << 20; // together; 256 MiB
-constexpr std::size_t kMaxFileBytes = 16u << 20;
+constexpr std::size_t kMaxFileBytes = 64u << 20;
 
 // The scene's name is the file's, without folder and extension. "-" is standard input; images then lie relative
 // to the current folder.

@@ -85,7 +85,7 @@ TEST_F(DrawTest, AMistakeIsNamedWithItsPlaceAndNothingIsWritten) {
                 {"image.json:2:27: bitmaps.a.file", "no.png", "No such file"});
     ExpectFails({"draw", "missing.json", "-o", "new.png"}, kFailed, {"missing.json", "No such file"});
     ExpectFails({"draw", ".", "-o", "new.png"}, kFailed, {"is a folder"});
-    ExpectFails({"draw", "/dev/zero", "-o", "new.png"}, kFailed, {"/dev/zero is larger than 16 MiB"});
+    ExpectFails({"draw", "/dev/zero", "-o", "new.png"}, kFailed, {"/dev/zero is larger than 64 MiB"});
     ExpectFails({"draw", "good.json", "-o", "nowhere/new.png"}, kFailed, {"nowhere", "create it first"});
 }
 

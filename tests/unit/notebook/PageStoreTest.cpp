@@ -1,0 +1,216 @@
+// What is on the disk after saves, autosaves, kills and failures.
+#include "apps/notebook/Document.h"
+#include "tests/support/TestFiles.h"
+#include "tests/unit/notebook/NotebookObjects.h"
+
+#include <csignal>
+#include <cstdlib>
+#include <filesystem>
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+#include <sys/wait.h>
+#include <unistd.h>
+
+namespace Moka::Testing {
+namespace {
+
+using ::testing::HasSubstr;
+
+class NotebookStoreTest : public ::testing::Test {
+protected:
+    NotebookStoreTest() { setenv("XDG_STATE_HOME", mFolder.Path("state").c_str(), 1); }
+
+    // A document as the window has it; what it tells goes into mTold.
+    std::unique_ptr<Document> Open(std::string const& path) {
+        auto document = std::make_unique<Document>(
+            Document::Callbacks{[](Splice const&) {}, [] {},
+                                [this](std::string const& text, bool) { mTold += text + '\n'; }, [] {}},
+            0);
+        document->Open(path);
+        return document;
+    }
+    // As after a kill: a copy of what is on the disk now, opened without the one that wrote it.
+    Objects OpenCopy(std::string const& name = "copy") {
+        std::filesystem::remove_all(mFolder.Path(name));
+        std::filesystem::create_directories(mFolder.Path(name));
+        for (char const* const file : {"p.json", "p.json.journal"})
+            if (std::filesystem::exists(mFolder.Path(file)))
+                std::filesystem::copy_file(mFolder.Path(file), mFolder.Path(name + "/" + file));
+        return Open(mFolder.Path(name + "/p.json"))->GetPage().GetObjects();
+    }
+    static void Autosave(Document& document) {
+        while (document.Tick(0) >= 0 || document.IsBusy()) {
+        }
+        document.Tick(0);
+    }
+
+    TempFolder mFolder;
+    std::string mTold;
+    std::string const mPath = mFolder.Path("p.json");
+    std::string const mJournal = mPath + ".journal";
+};
+
+TEST_F(NotebookStoreTest, AnAutosaveAppendsTheChangesAndAKillLosesNone) {
+    auto const document = Open(mPath);
+    Page& page = document->GetPage();
+    for (int i = 0; i < 3; ++i) page.Append(MakeDash(1, static_cast<float>(i)));
+    page.Undo();
+    page.Replace(0, {MakeDash(2, 2), MakeDash(3, 3)});
+    Autosave(*document);
+    EXPECT_TRUE(AreSame(OpenCopy(), page.GetObjects()));
+    std::uintmax_t const size = std::filesystem::file_size(mJournal);
+    page.Append(MakeDash(4, 4));
+    Autosave(*document);
+    EXPECT_LT(std::filesystem::file_size(mJournal) - size, 200u) << "more than one stroke was written";
+    EXPECT_TRUE(AreSame(OpenCopy(), page.GetObjects()));
+    document->Save(nullptr);
+    EXPECT_TRUE(document->Close());
+    EXPECT_FALSE(std::filesystem::exists(mJournal));
+    EXPECT_TRUE(AreSame(OpenCopy(), page.GetObjects()));
+    EXPECT_EQ(mTold, "saved " + mPath + "\n");
+}
+
+// Cut anywhere, the journal gives a state the page had, and goes on from there.
+TEST_F(NotebookStoreTest, AJournalCutOffAtAnyByteGivesAnEarlierState) {
+    std::vector<Objects> states{{}};
+    {
+        auto const document = Open(mPath);
+        for (int i = 0; i < 4; ++i) {
+            document->GetPage().Append(MakeDash(1, static_cast<float>(i)));
+            states.push_back(document->GetPage().GetObjects());
+        }
+        Autosave(*document);
+    }
+    std::string const whole = ReadFile(mJournal);
+    std::size_t last = 0;
+    for (std::size_t size = 0; size <= whole.size(); size += 13) {
+        WriteFile(mJournal, whole.substr(0, size));
+        Objects const objects = OpenCopy();
+        std::size_t const count = objects.size();
+        ASSERT_TRUE(AreSame(objects, states.at(count))) << size;
+        EXPECT_GE(count, last);
+        last = count;
+    }
+    EXPECT_GE(last, 3u);
+    WriteFile(mJournal, whole.substr(0, whole.size() - 5));
+    auto const document = Open(mPath);
+    document->GetPage().Append(MakeDash(9, 9));
+    Autosave(*document);
+    EXPECT_TRUE(AreSame(OpenCopy(), document->GetPage().GetObjects()));
+    EXPECT_EQ(mTold, "");
+}
+
+TEST_F(NotebookStoreTest, AJournalLeftByAnInterruptedSaveIsNotAppliedTwice) {
+    auto const document = Open(mPath);
+    document->GetPage().Append(MakeDash(1, 1));
+    Autosave(*document);
+    std::string const journal = ReadFile(mJournal);
+    document->Save(nullptr);
+    ASSERT_TRUE(document->Close());
+    std::string const page = ReadFile(mPath);
+    // The save marks the journal with the page that it becomes, then replaces the page, then removes the journal.
+    document->GetPage().Append(MakeDash(2, 2));
+    Autosave(*document);
+    std::string const second = ReadFile(mJournal);
+    std::string const base = second.substr(std::string("continues ").size(), 16);
+    WriteFile(mJournal, journal + "saved " + base + "\n");
+    EXPECT_EQ(OpenCopy().size(), 1u);
+    WriteFile(mJournal, journal);
+    WriteFile(mPath, page + "\n");
+    mTold.clear();
+    EXPECT_EQ(Open(mPath)->GetPage().GetObjects().size(), 1u);
+    EXPECT_THAT(mTold, HasSubstr("kept as " + mJournal + ".kept"));
+    EXPECT_EQ(ReadFile(mJournal + ".kept"), journal);
+}
+
+TEST_F(NotebookStoreTest, APageThatWasNotReadWholeIsSavedUnderANewNameOnly) {
+    {
+        auto const document = Open(mPath);
+        for (int i = 0; i < 3; ++i) document->GetPage().Append(MakeDash(1, static_cast<float>(i)));
+        EXPECT_TRUE(document->Close());
+    }
+    std::string broken = ReadFile(mPath);
+    broken.replace(broken.rfind("DrawStroke"), 10, "DrawCircle");
+    WriteFile(mPath, broken);
+    mTold.clear();
+    auto const document = Open(mPath);
+    EXPECT_THAT(mTold, HasSubstr("save"));
+    EXPECT_EQ(document->GetPage().GetObjects().size(), 2u);
+    document->GetPage().Append(MakeDash(7, 7));
+    EXPECT_FALSE(document->Save(nullptr));
+    std::string const elsewhere = mFolder.Path("new.json");
+    EXPECT_TRUE(document->Save(&elsewhere));
+    EXPECT_TRUE(document->Close());
+    EXPECT_EQ(ReadFile(mPath), broken);
+    EXPECT_EQ(document->GetPath(), elsewhere);
+    EXPECT_FALSE(document->MustRename());
+    EXPECT_EQ(Open(elsewhere)->GetPage().GetObjects().size(), 3u);
+    EXPECT_EQ(Document::GetLastPath(), elsewhere);
+}
+
+// A folder in the place of the file: fails for every user, root among them.
+TEST_F(NotebookStoreTest, AFailedSaveSaysSoAndLosesNothing) {
+    auto const document = Open(mPath);
+    document->GetPage().Append(MakeDash(1, 1));
+    std::filesystem::create_directories(mJournal + "/x");
+    Autosave(*document);
+    EXPECT_THAT(mTold, HasSubstr("cannot autosave to " + mJournal));
+    std::string const to = mFolder.Path("none/such/folder.json");
+    document->Save(&to);
+    EXPECT_FALSE(document->Close());
+    EXPECT_THAT(mTold, HasSubstr("cannot save " + to));
+    EXPECT_TRUE(document->HasUnsaved());
+    EXPECT_EQ(document->GetPath(), mPath);
+    std::filesystem::remove_all(mJournal);
+    document->GetPage().Append(MakeDash(2, 2));
+    Autosave(*document);
+    EXPECT_EQ(OpenCopy().size(), 2u) << "what could not be appended came with the next autosave";
+    std::filesystem::create_directories(mPath + "/x");
+    document->Save(nullptr);
+    EXPECT_FALSE(document->Close());
+}
+
+// Writes strokes without a pause and tells, through the pipe, how many an autosave or a save has put on the disk.
+[[noreturn]] void WriteUntilKilled(Document& document, int pipe) {
+    for (int count = 0;; ++count) {
+        document.GetPage().Append(MakeDash(1, static_cast<float>(count)));
+        if (count % 5 != 0) continue;
+        if (count % 35 == 0)
+            document.Save(nullptr);
+        else
+            document.Tick(0), document.Tick(0);
+        while (document.IsBusy()) usleep(100);
+        int const kept = count + 1;
+        if (write(pipe, &kept, sizeof(kept)) < 0) _exit(1);
+    }
+}
+
+TEST_F(NotebookStoreTest, TwentyKillsAfter100MillisecondsLoseNothingThatWasWritten) {
+    int most = 0;
+    for (int kill = 0; kill < 20; ++kill) {
+        for (char const* const file : {"p.json", "p.json.journal"})
+            std::filesystem::remove(mFolder.Path(file));
+        int ends[2];
+        ASSERT_EQ(pipe(ends), 0);
+        pid_t const child = fork();
+        if (child == 0) WriteUntilKilled(*Open(mPath), ends[1]);
+        close(ends[1]);
+        usleep(100'000);
+        ::kill(child, SIGKILL);
+        waitpid(child, nullptr, 0);
+        int kept = 0;
+        while (read(ends[0], &kept, sizeof(kept)) == sizeof(kept)) {
+        }
+        close(ends[0]);
+        Objects const found = OpenCopy();
+        EXPECT_EQ(mTold, "");
+        ASSERT_GE(found.size(), static_cast<std::size_t>(kept));
+        for (std::size_t i = 0; i < found.size(); ++i)
+            ASSERT_TRUE(AreSame({found[i]}, {MakeDash(1, static_cast<float>(i))})) << i;
+        most = std::max(most, kept);
+    }
+    EXPECT_GT(most, 0) << "no child came as far as its first autosave";
+}
+
+} // namespace
+} // namespace Moka::Testing
