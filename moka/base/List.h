@@ -1,8 +1,8 @@
-// List: an ordered list of pointers that it does not own.
-// Cost:   adding at the end and removing at either end are amortised O(1), so it serves as a queue; removing
-//         elsewhere moves what follows. An empty list that was never filled has allocated nothing.
-// Thread: not synchronised.
-// Fails:  nothing throws.
+/// List: an ordered list of pointers that it does not own.
+/// Cost:   adding at the end and removing at either end are amortised O(1), so it serves as a queue; removing
+///         elsewhere moves what follows. An empty list that was never filled has allocated nothing.
+/// Thread: not synchronised.
+/// Fails:  nothing throws.
 #pragma once
 
 #include <algorithm>
@@ -15,19 +15,21 @@ namespace Moka {
 template <class T>
 class List {
 public:
-    // Completes construction; false when memory for it cannot be had. May be called once.
+    /// Completes construction; false without memory. May be called once.
     bool Construct() { return true; }
 
+    /// The number of items.
     int GetCount() const { return static_cast<int>(mItems.size() - mTaken); }
+    /// True without items.
     bool IsEmpty() const { return GetCount() == 0; }
 
-    // Null when index is outside 0 ... count - 1.
+    /// Null when index is outside 0 ... count - 1.
     T* GetAt(int index) const {
         std::size_t const at = mTaken + static_cast<std::size_t>(index);
         return index >= 0 && at < mItems.size() ? mItems[at] : nullptr;
     }
 
-    // False, with the list unchanged, when memory for the item cannot be had.
+    /// False, with the list unchanged, without memory for the item.
     [[nodiscard]] bool Add(T* item) {
         try {
             mItems.push_back(item);
@@ -37,7 +39,7 @@ public:
         }
     }
 
-    // Takes the item out and returns it; null when index is outside 0 ... count - 1.
+    /// Takes the item out and returns it; null when index is outside 0 ... count - 1.
     T* RemoveAt(int index) {
         if (index < 0 || index >= GetCount()) return nullptr;
         auto const at = Begin() + index;
@@ -46,7 +48,7 @@ public:
         return item;
     }
 
-    // Removes the first occurrence; false when there is none.
+    /// Removes the first occurrence; false when there is none.
     bool Remove(T const* item) {
         auto const at = std::find(Begin(), mItems.end(), item);
         if (at == mItems.end()) return false;
@@ -54,6 +56,7 @@ public:
         return true;
     }
 
+    /// Removes all items.
     void Clear() {
         mItems.clear();
         mTaken = 0;

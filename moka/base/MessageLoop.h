@@ -1,8 +1,8 @@
-// MessageLoop: runs the messages of the Handlers that one thread made.
-// Owner:  the thread that constructs it; at most one a thread, found with GetCurrent().
-// Thread: Run, RunPending and destruction on the owning thread; Quit and the posting side of Handler from
-//         any.
-// Fails:  an exception out of a message is one error line, and the loop goes on.
+/// MessageLoop: runs the messages of the Handlers that one thread created.
+/// Owner:  the thread that constructs it; at most one a thread, found with GetCurrent().
+/// Thread: Run, RunPending and destruction on the owning thread; Quit and the posting side of Handler from
+///         any.
+/// Fails:  an exception of a message is logged as an error, and the loop continues.
 #pragma once
 
 #include "moka/base/Export.h"
@@ -19,20 +19,20 @@ struct MessageQueue;
 class MOKA_API MessageLoop : NonAssignable {
 public:
     MessageLoop();
-    // Messages that have not run are dropped.
+    /// Messages that have not run are dropped.
     ~MessageLoop();
 
-    // The calling thread's loop; null when it has none.
+    /// The calling thread's loop; null when it has none.
     static MessageLoop* GetCurrent();
 
-    // Runs messages in the order they were sent until Quit. A message may call it, or RunPending, again.
+    /// Runs messages in the order they were sent until Quit. A message may call it, or RunPending, again.
     void Run();
 
-    // Runs what is pending now, then returns the number of messages run. What they send stays for later.
+    /// Runs the messages that are pending now and returns their number. Messages that they send run later.
     int RunPending();
 
-    // Makes Run return after the message it is running; the innermost one, if several are. When none is, the
-    // next one returns at once.
+    /// Makes Run return after the message it is running; the innermost one, if several are. When none is, the
+    /// next one returns at once.
     void Quit();
 
 private:

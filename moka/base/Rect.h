@@ -1,5 +1,5 @@
-// Rect and RectF: axis-aligned rectangles in pixels, y down. Right and bottom are exclusive for integers.
-// The members keep the order left, top, right, bottom; nothing sorts them, so a width can be negative.
+/// Rect and RectF: axis-aligned rectangles in pixels, y down. Right and bottom are exclusive for integers.
+/// The members keep the order left, top, right, bottom; nothing sorts them, so a width can be negative.
 #pragma once
 
 #include "moka/base/Export.h"
@@ -12,62 +12,72 @@ namespace Moka {
 
 class RectF;
 
+/// A rectangle with whole edges; right and bottom are exclusive.
 class MOKA_API Rect {
 public:
+    /// The edges; not sorted.
     int left = 0;
     int top = 0;
     int right = 0;
     int bottom = 0;
 
     constexpr Rect() = default;
+    /// From its edges.
     constexpr Rect(int l, int t, int r, int b) : left(l), top(t), right(r), bottom(b) {}
 
-    // The smallest integer rectangle around r: left and top rounded down, right and bottom up, each saturated
-    // to the range of int. A NaN edge becomes 0.
+    /// The smallest integer rectangle around r: left and top rounded down, right and bottom up, each saturated
+    /// to the range of int. A NaN edge becomes 0.
     explicit Rect(RectF const& r);
     Rect& operator=(RectF const& r);
 
-    int GetWidth() const;  // right - left, saturated
-    int GetHeight() const; // bottom - top, saturated
-    bool IsEmpty() const;  // width or height is not positive
+    int GetWidth() const;  ///< right - left, saturated
+    int GetHeight() const; ///< bottom - top, saturated
+    bool IsEmpty() const;  ///< width or height is not positive
 
-    bool Contains(Point const& p) const; // left <= x < right and top <= y < bottom
+    bool Contains(Point const& p) const; ///< left <= x < right and top <= y < bottom
 
-    // Whether the two share at least one pixel.
+    /// Whether the two share at least one pixel.
     bool IsIntersect(Rect const& other) const;
-    // The shared pixels; a default (all zero) rectangle when there are none.
+    /// The shared pixels; a default (all zero) rectangle when there are none.
     Rect Intersect(Rect const& other) const;
 
+    /// Compares the edges.
     friend constexpr bool operator==(Rect const& a, Rect const& b) {
         return a.left == b.left && a.top == b.top && a.right == b.right && a.bottom == b.bottom;
     }
     friend constexpr bool operator!=(Rect const& a, Rect const& b) { return !(a == b); }
 };
 
+/// A rectangle, in pixels or local units.
 class MOKA_API RectF {
 public:
+    /// The edges; not sorted.
     float left = 0;
     float top = 0;
     float right = 0;
     float bottom = 0;
 
     constexpr RectF() = default;
+    /// From its edges.
     constexpr RectF(float l, float t, float r, float b) : left(l), top(t), right(r), bottom(b) {}
+    /// The same rectangle.
     explicit RectF(Rect const& r)
         : left(static_cast<float>(r.left)),
           top(static_cast<float>(r.top)),
           right(static_cast<float>(r.right)),
           bottom(static_cast<float>(r.bottom)) {}
 
+    /// Replaces all edges.
     void Set(float l, float t, float r, float b) { *this = RectF(l, t, r, b); }
 
+    /// Differences of the edges; may be negative.
     float GetWidth() const { return right - left; }
     float GetHeight() const { return bottom - top; }
-    // Width or height is not positive, or not a number.
+    /// Width or height is not positive, or not a number.
     bool IsEmpty() const { return !(left < right && top < bottom); }
 
-    // Grows the rectangle so that it contains (x, y); start from a degenerate rectangle at the first point.
-    // A coordinate that is NaN changes nothing.
+    /// Grows the rectangle so that it contains (x, y); start from a degenerate rectangle at the first point.
+    /// A coordinate that is NaN changes nothing.
     void MakeRect(float x, float y) {
         if (x < left) left = x;
         if (x > right) right = x;
@@ -75,20 +85,21 @@ public:
         if (y > bottom) bottom = y;
     }
 
-    // Rounds outwards to whole numbers: left and top down, right and bottom up.
+    /// Rounds outwards to whole numbers: left and top down, right and bottom up.
     void ExtendRect();
 
-    // Moves every edge outwards by the given distances (inwards when negative).
+    /// Moves every edge outwards by the given distances (inwards when negative).
     void IncreaseRect(float dx, float dy) { Set(left - dx, top - dy, right + dx, bottom + dy); }
 
-    // Per axis, with lo the greater of the low edges and hi the lesser of the high ones: overlap when lo <
-    // hi, or when lo == hi and one of the two has no extent on that axis. So horizontal and vertical lines
-    // count, a full rectangle that ends exactly on the other's edge does not. NaN never intersects.
+    /// Per axis, with lo the greater of the low edges and hi the lesser of the high ones: overlap when lo <
+    /// hi, or when lo == hi and one of the two has no extent on that axis. So horizontal and vertical lines
+    /// count, a full rectangle that ends exactly on the other's edge does not. NaN never intersects.
     bool IsIntersect(RectF const& other) const {
         return OverlapsOnAxis(left, right, other.left, other.right) &&
                OverlapsOnAxis(top, bottom, other.top, other.bottom);
     }
 
+    /// Compares the edges.
     friend constexpr bool operator==(RectF const& a, RectF const& b) {
         return a.left == b.left && a.top == b.top && a.right == b.right && a.bottom == b.bottom;
     }

@@ -1,7 +1,7 @@
-// RefCount: an atomic reference count that deletes its object when the last reference goes.
-// Owner:   starts at one, which belongs to whoever created the object.
-// Thread:  any. The last Unref sees everything that other threads did before theirs.
-// Usable as a public, private or second base: the object is deleted through the virtual destructor.
+/// RefCount: an atomic reference count that deletes its object when the last reference goes.
+/// Owner:   starts at one, which belongs to the creator.
+/// Thread:  any. The last Unref sees everything that other threads did before theirs.
+/// Usable as a public, private or second base: the object is deleted through the virtual destructor.
 #pragma once
 
 #include "moka/base/Export.h"
@@ -17,11 +17,11 @@ public:
     RefCount& operator=(RefCount const&) = delete;
     virtual ~RefCount();
 
-    // Both return the count after the operation. After an Unref that returned 0 the object is gone.
+    /// Both return the count after the operation. After an Unref that returned 0 the object is gone.
     int Ref() noexcept;
     int Unref();
 
-    // A snapshot; only a caller that knows nobody else holds a reference can rely on it.
+    /// A snapshot; only a caller that knows nobody else holds a reference can rely on it.
     int GetRefCount() const noexcept;
 
 private:

@@ -1,5 +1,5 @@
-// RefPtr: holds one reference on an object with Ref() and Unref().
-// Adopting takes over a reference that the caller already has; sharing takes one more.
+/// RefPtr: holds one reference on an object with Ref() and Unref().
+/// Adopt takes over a reference of the caller's, Share takes a new one.
 #pragma once
 
 #include <utility>
@@ -10,6 +10,7 @@ template <class T>
 class RefPtr {
 public:
     RefPtr() noexcept = default;
+    /// A copy holds a reference of its own; a move takes it over.
     RefPtr(RefPtr const& other) : mObject(other.mObject) {
         if (mObject) mObject->Ref();
     }
@@ -22,22 +23,25 @@ public:
         if (mObject) mObject->Unref();
     }
 
+    /// Takes over a reference that the caller has. Null makes an empty pointer.
     static RefPtr Adopt(T* object) noexcept {
         RefPtr pointer;
         pointer.mObject = object;
         return pointer;
     }
+    /// Takes a new reference. Null makes an empty pointer.
     static RefPtr Share(T* object) {
         if (object) object->Ref();
         return Adopt(object);
     }
 
+    /// The object; null if empty. The caller gets no reference.
     T* Get() const noexcept { return mObject; }
     T* operator->() const noexcept { return mObject; }
     T& operator*() const noexcept { return *mObject; }
     explicit operator bool() const noexcept { return mObject != nullptr; }
 
-    // Gives the reference up to the caller.
+    /// Gives the reference up to the caller.
     [[nodiscard]] T* Release() noexcept { return std::exchange(mObject, nullptr); }
 
 private:

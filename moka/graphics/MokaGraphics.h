@@ -1,4 +1,4 @@
-// MokaGraphics.h: the public surface of the library, for those who want all of it.
+/// MokaGraphics.h: the public surface of the library, for those who want all of it.
 #pragma once
 
 #include "moka/base/Bitmap.h"

@@ -1,11 +1,11 @@
-// TaskQueue: the queue half of a render thread: any thread posts, one thread runs. An intrusive list under
-// one short lock, taken over whole by the consumer and notified only when it sleeps; posting allocates
-// nothing.
-// Owner:   whoever makes it; it must outlive every post. Tasks that were never run are freed with it, and
-//          threads that still wait for them are let go.
-// Thread:  Post and WaitForTasks from any; Run once, on the one consumer thread. No lock is held while a
-//          task runs or is freed.
-// Order:   posting order.
+/// TaskQueue: the queue half of a render thread: any thread posts, one thread runs. An intrusive list under
+/// one short lock, taken over whole by the consumer and notified only when it sleeps; posting allocates
+/// nothing.
+/// Owner:   the creator; it must outlive every post. Tasks that were never run are freed with it, and
+///          threads that still wait for them return.
+/// Thread:  Post and WaitForTasks from any; Run once, on the one consumer thread. No lock is held while a
+///          task runs or is freed.
+/// Order:   posting order.
 #pragma once
 
 #include "moka/base/Export.h"
@@ -27,22 +27,23 @@ public:
     TaskQueue(TaskQueue const&) = delete;
     TaskQueue& operator=(TaskQueue const&) = delete;
 
-    // Accepted until Run() has returned; also from inside a running task. Null is ignored: false.
+    /// Accepted until Run() has returned; also from inside a running task. Null is ignored: false.
     bool Post(ITask* task) override;
 
-    // Returns when everything posted before the call has been run and freed; at once when nothing is left to
-    // run. On the consumer thread itself it logs an error and returns at once.
+    /// Returns when everything posted before the call has been run and freed; at once when nothing is left to
+    /// run. On the consumer thread itself it logs an error and returns at once.
     void WaitForTasks() override;
 
 protected:
-    // Runs tasks until RequestStop(), then what was accepted and what those tasks post, then refuses and
-    // returns. onIdle is called each time the queue has run empty, before sleeping or returning; it may post.
-    // An exception out of a task is logged; the task is freed and the loop goes on.
+    /// Runs tasks until RequestStop(), then the accepted tasks and those that they post, then refuses and
+    /// returns. onIdle is called each time the queue has run empty, before sleeping or returning; it may
+    /// post. An exception of a task is logged; the task is freed and the loop continues.
     void Run(std::function<void()> const& onIdle);
-    // From any thread, also before Run() or from inside a task. Run() returns at the first moment when nothing
-    // is queued, so whoever posts without a pause keeps it from returning.
+    /// From any thread, also before Run() or from inside a task. Run() returns at the first moment when
+    /// nothing is queued, so whoever posts without a pause keeps it from returning.
     void RequestStop();
 
+    /// Whether this thread runs the tasks.
     bool IsConsumerThread() const;
 
 private:

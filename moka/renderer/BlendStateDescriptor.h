@@ -1,10 +1,10 @@
-// BlendStateDescriptor: how a fragment and the pixel under it become the pixel, as a value.
-// A new one that is enabled replaces: the source counts once and the destination not at all.
+/// BlendStateDescriptor: how a fragment is combined with the pixel under it, as a value.
+/// A new one that is enabled replaces: the source counts once and the destination not at all.
 #pragma once
 
 namespace Moka {
 
-// One byte each: a descriptor is compared and copied for every draw.
+/// One byte each: a descriptor is compared and copied for every draw.
 enum class BlendingFactor : unsigned char {
     Zero,
     One,
@@ -15,28 +15,33 @@ enum class BlendingFactor : unsigned char {
     OneMinusDstAlpha,
 };
 
+/// How the products are combined.
 enum class BlendingFunction : unsigned char { Add };
 
 class BlendStateDescriptor {
 public:
-    // source * sourceFactor (function) destination * destinationFactor
+    /// source * sourceFactor (function) destination * destinationFactor
     struct Equation {
+        /// The function and its factors.
         BlendingFunction function = BlendingFunction::Add;
         BlendingFactor source = BlendingFactor::One;
         BlendingFactor destination = BlendingFactor::Zero;
 
+        /// Compares all values.
         friend bool operator==(Equation const& a, Equation const& b) {
             return a.function == b.function && a.source == b.source && a.destination == b.destination;
         }
     };
 
-    // Neither blends nor writes colour when enabled is false.
+    /// Neither blends nor writes colour when enabled is false.
     explicit BlendStateDescriptor(bool enabled) : mBlending(enabled), mColorWrite(enabled) {}
 
+    /// Whether to blend, and whether to write colours.
     void SetEnabled(bool blending, bool colorWrite) {
         mBlending = blending;
         mColorWrite = colorWrite;
     }
+    /// The equations of colour and alpha.
     void SetColorEquation(BlendingFunction function, BlendingFactor source, BlendingFactor destination) {
         mColor = {function, source, destination};
     }
@@ -44,11 +49,13 @@ public:
         mAlpha = {function, source, destination};
     }
 
+    /// The values set.
     bool IsBlending() const { return mBlending; }
     bool IsColorWrite() const { return mColorWrite; }
     Equation const& GetColorEquation() const { return mColor; }
     Equation const& GetAlphaEquation() const { return mAlpha; }
 
+    /// Compares all values.
     friend bool operator==(BlendStateDescriptor const& a, BlendStateDescriptor const& b) {
         return a.mBlending == b.mBlending && a.mColorWrite == b.mColorWrite && a.mColor == b.mColor &&
                a.mAlpha == b.mAlpha;

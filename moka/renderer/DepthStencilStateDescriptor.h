@@ -1,13 +1,14 @@
-// DepthStencilStateDescriptor: the depth and stencil tests of both faces, as a value.
-// A new one with the stencil on always passes and keeps the stored value. The depth test, if on, passes nearer
-// fragments and writes their depth.
+/// DepthStencilStateDescriptor: the depth and stencil tests of both faces, as a value.
+/// A new one with the stencil on always passes and keeps the stored value. The depth test, if on, passes nearer
+/// fragments and writes their depth.
 #pragma once
 
 namespace Moka {
 
-// The numbers are the interface.
+/// The numbers are the interface.
 enum StencilComparison { StencilEqual = 2, StencilNotEqual = 5, StencilAlways = 7 };
 
+/// What happens to the stored value.
 enum StencilOperation {
     StencilKeep = 0,
     StencilZero = 1,
@@ -18,10 +19,11 @@ enum StencilOperation {
 
 class DepthStencilStateDescriptor {
 public:
+    /// Whether to test depth and stencil.
     DepthStencilStateDescriptor(bool depth, bool stencil) : mDepth(depth), mStencil(stencil) {}
 
-    // Passes where (reference & readMask) compares to (stored value & readMask); writeMask says which bits
-    // an operation may change.
+    /// Passes where (reference & readMask) compares to (stored value & readMask); writeMask says which bits
+    /// an operation may change.
     void SetStencilFunction(StencilComparison comparison, int reference, unsigned readMask,
                             unsigned writeMask) {
         mComparison = comparison;
@@ -36,6 +38,7 @@ public:
         mPass = pass;
     }
 
+    /// The values set.
     bool IsDepth() const { return mDepth; }
     bool IsStencil() const { return mStencil; }
     StencilComparison GetComparison() const { return mComparison; }
@@ -46,7 +49,7 @@ public:
     StencilOperation GetDepthFail() const { return mDepthFail; }
     StencilOperation GetPass() const { return mPass; }
 
-    // Without a stencil test, what the test would do does not matter.
+    /// Without a stencil test, what the test would do does not matter.
     friend bool operator==(DepthStencilStateDescriptor const& a, DepthStencilStateDescriptor const& b) {
         if (a.mDepth != b.mDepth || a.mStencil != b.mStencil) return false;
         return !a.mStencil || a.HasStencilOf(b);

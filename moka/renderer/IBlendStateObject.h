@@ -1,6 +1,6 @@
-// IBlendStateObject: a blend state that can be put in force.
-// Owner:  whoever created it, until Release(), which keeps an applied state in force.
-// Thread: render thread.
+/// IBlendStateObject: a blend state that can be applied.
+/// Owner:  the creator, until Release(), which leaves an applied state set.
+/// Thread: render thread.
 #pragma once
 
 #include "moka/renderer/BlendStateDescriptor.h"
@@ -9,7 +9,7 @@ namespace Moka {
 
 class IBlendStateObject {
 public:
-    // Takes effect with the next Apply().
+    /// Takes effect with the next Apply().
     virtual void SetDescriptor(BlendStateDescriptor const& descriptor) = 0;
     virtual void Apply() = 0;
     virtual void Release() = 0;

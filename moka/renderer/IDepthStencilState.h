@@ -1,6 +1,6 @@
-// IDepthStencilState: a depth-stencil state that can be put in force.
-// Owner:  whoever created it, until Release(), which keeps an applied state in force.
-// Thread: render thread.
+/// IDepthStencilState: a depth-stencil state that can be applied.
+/// Owner:  the creator, until Release(), which leaves an applied state set.
+/// Thread: render thread.
 #pragma once
 
 #include "moka/renderer/DepthStencilStateDescriptor.h"
@@ -9,13 +9,14 @@ namespace Moka {
 
 class IDepthStencilState {
 public:
-    // Takes effect with the next Apply().
+    /// Takes effect with the next Apply().
     virtual void SetDescriptor(DepthStencilStateDescriptor const& descriptor) = 0;
 
-    // While a stencil clip is in force (RendererFactory::SetStencilClip), a state without a stencil test
-    // leaves the clip's test as it is.
+    /// While a stencil clip is set (RendererFactory::SetStencilClip), a state without a stencil test
+    /// leaves the clip's test as it is.
     virtual void Apply() = 0;
 
+    /// Deletes the object.
     virtual void Release() = 0;
 
 protected:

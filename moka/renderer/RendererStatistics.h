@@ -1,5 +1,6 @@
-// RendererStatistics: the renderer's live objects, and counts of its work since the context was attached.
-// Objects are counted by kind. If any but the pooled ones are left when a test ends, the test has found a leak.
+/// RendererStatistics: the renderer's live objects, and counts of its work since the context was attached.
+/// Objects are counted by kind. If any but the pooled ones are left when a test ends, the test has found a
+/// leak.
 #pragma once
 
 #include <array>
@@ -7,22 +8,23 @@
 
 namespace Moka {
 
-// Why a draw could not join the run of draws before it. Runs of one state become one draw call each.
+/// Why a draw could not join the run of draws before it. Runs of one state become one draw call each.
 enum class RunEnd {
     Program,
-    Texture, // or its sampling
+    Texture, ///< or its sampling
     Blend,
     Scissor,
-    Clip, // or another depth-stencil state
+    Clip, ///< or another depth-stencil state
     Target,
-    Primitive, // or the layout of the vertices; a strip is always a run of its own
-    Values,    // integers that the run has as constants, or vertices that are too many to be moved together
-    Full,      // the list, or a block of values
-    Other,     // a clear, a copy or a flush lies between
+    Primitive, ///< or the layout of the vertices; a strip is always a run of its own
+    Values,    ///< integers that the run has as constants, or vertices that are too many to be moved together
+    Full,      ///< the list, or a block of values
+    Other,     ///< a clear, a copy or a flush lies between
 };
+/// The number of reasons.
 inline constexpr std::size_t kRunEnds = 10;
 
-// One lower-case word.
+/// One lower-case word.
 constexpr char const* GetName(RunEnd end) {
     switch (end) {
     case RunEnd::Program:
@@ -50,46 +52,48 @@ constexpr char const* GetName(RunEnd end) {
 }
 
 struct RendererStatistics {
-    int textures = 0; // storages, not views
+    int textures = 0; ///< storages, not views
+    /// Live objects by kind.
     int samplers = 0;
-    int frameBuffers = 0;  // made by us
-    int renderBuffers = 0; // in use; pooled ones are counted apart
+    int frameBuffers = 0;  ///< created by the renderer
+    int renderBuffers = 0; ///< in use; pooled ones are counted apart
     int pooledRenderBuffers = 0;
-    int renderTargets = 0; // objects of our interfaces
+    int renderTargets = 0; ///< objects of our interfaces
     int textureObjects = 0;
     int depthStencilBuffers = 0;
     int programs = 0;
-    int variants = 0; // of programs, which draw runs whose uniform values differ
+    int variants = 0; ///< of programs, which draw runs whose uniform values differ
     int graphicsObjects = 0;
-    int stateObjects = 0; // blend and depth-stencil states
-    int buffers = 0;      // vertex buffers and vertex arrays of the context's own, kept until it is detached
+    int stateObjects = 0; ///< blend and depth-stencil states
+    int buffers = 0; ///< vertex buffers and vertex arrays of the context's own, kept until it is detached
 
-    // Draws that were requested, the runs that they were joined to, and the draw calls that the driver got.
+    /// Draws that were requested, the runs that they were joined to, and the draw calls that the driver got.
     std::uint64_t drawRequests = 0;
     std::uint64_t runs = 0;
     std::uint64_t draws = 0;
-    std::uint64_t records = 0;                     // sets of uniform values in the runs
-    std::array<std::uint64_t, kRunEnds> runEnds{}; // by RunEnd
-    std::uint64_t flushes = 0;                     // of the draw list
-    std::uint64_t listBytes = 0;                   // memory that the draw list holds
+    std::uint64_t records = 0;                     ///< sets of uniform values in the runs
+    std::array<std::uint64_t, kRunEnds> runEnds{}; ///< by RunEnd
+    std::uint64_t flushes = 0;                     ///< of the draw list
+    std::uint64_t listBytes = 0;                   ///< memory that the draw list holds
 
-    // Calls that change the driver's state.
+    /// Calls that change the driver's state.
     std::uint64_t frameBufferSwitches = 0;
     std::uint64_t programSwitches = 0;
     std::uint64_t uniformChanges = 0;
     std::uint64_t textureSwitches = 0;
-    std::uint64_t blendChanges = 0; // with the colour mask
+    std::uint64_t blendChanges = 0; ///< with the colour mask
     std::uint64_t depthStencilChanges = 0;
     std::uint64_t scissorChanges = 0;
-    std::uint64_t queries = 0; // questions to the driver, each of which may wait for it
+    std::uint64_t queries = 0; ///< questions to the driver, each of which may wait for it
 
+    /// Work and bytes moved.
     std::uint64_t clears = 0;
     std::uint64_t copies = 0;
-    std::uint64_t mipmapUpdates = 0; // times that the levels of a texture were made
-    std::uint64_t bytesUploaded = 0; // texels
+    std::uint64_t mipmapUpdates = 0; ///< times that a texture's levels were generated
+    std::uint64_t bytesUploaded = 0; ///< texels
     std::uint64_t vertexBytes = 0;
     std::uint64_t bytesReadBack = 0;
-    std::uint64_t errors = 0; // GL errors and error-severity debug messages
+    std::uint64_t errors = 0; ///< GL errors and error-severity debug messages
 };
 
 } // namespace Moka

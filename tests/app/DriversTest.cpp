@@ -31,7 +31,7 @@ struct Bound {
 };
 // Scenes that the reference cannot draw.
 constexpr Bound kBounds[] = {
-    {"bitmap-scaled", 24},    // grain of single pixels, sampled between them, where a 256th of a texel shows
+    {"bitmap-scaled", 64}, // grain of single texels; at a tenth of its size, 1/32 pixel is a third of a texel
     {"non-premultiplied", 8}, // divides by an alpha down to 0.15, which makes a step up to seven
     {"note", 255},            // single pixels of its slim triangles; few: see kMostOnEdges
     {"pen-stroke", 16},       // its ink falls off over a pixel, by 255 / 32 steps on each axis that moves

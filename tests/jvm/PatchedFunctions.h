@@ -43,6 +43,7 @@ public:
         };
     }
     JNINativeInterface_* operator->() { return mFunctions.operator->(); }
+    JNINativeInterface_ const& GetOriginal() const { return mFunctions.GetOriginal(); }
 
 private:
     static char const* Hide(char const* name) { return sMissing == name ? "isNotThere" : name; }

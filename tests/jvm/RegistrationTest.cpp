@@ -95,6 +95,7 @@ TEST(Registration, AClassThatIsMissingIsTheExceptionOfTheLoading) {
         {
             MissingName missing(env, name);
             missing->RegisterNatives = &RegisterNatives;
+            original = &missing.GetOriginal();
             registration = -1; // or the loader's thread would be started
             JNI_OnLoad(JavaMachine::GetVm(), nullptr);
         }

@@ -140,11 +140,6 @@ public:
         notes.events.emplace_back(std::move(clear));
     }
 
-    void OnMisuse(std::string const& what) {
-        std::lock_guard const lock(mutex);
-        notes.violations.push_back(what);
-    }
-
     std::string NameOf(void const* object) const {
         auto const found = objects.find(object);
         return found == objects.end() ? "none" : found->second.GetName();

@@ -3,9 +3,6 @@
 #pragma once
 
 #include "moka/renderer/null/NullDevice.h"
-#include "tests/support/TraceObserver.h"
-
-#include <algorithm>
 
 namespace Moka::Testing {
 
@@ -29,14 +26,6 @@ public:
         detail::DeviceName const name = NullDevice::CreateTexture(width, height);
         MakeLoud({0, name, width, height, 0});
         return name;
-    }
-
-    void Submit(detail::DrawList const& list) override {
-        bool const draws = std::any_of(list.commands.begin(), list.commands.end(), [](auto const& command) {
-            return std::holds_alternative<detail::Run>(command);
-        });
-        if (draws && list.vertices.empty()) TraceObserver::Get().OnMisuse("a draw without vertices");
-        NullDevice::Submit(list);
     }
 
     // Rows packed, in texture order.

@@ -1,6 +1,6 @@
-// AndroidLog.h: the one way this tree logs, __android_log_print. On Android it is the system's; elsewhere the
-// library built from this folder supplies the symbol and writes "LEVEL tag: text" to stderr.
-// Thread: any. A line is written in one piece. Cost: a format and a write; never called on a hot path.
+/// AndroidLog.h: the one way this tree logs, __android_log_print. On Android it is the system's; elsewhere the
+/// library built from this folder supplies the symbol and writes "LEVEL tag: text" to stderr.
+/// Thread: any. A line is written in one piece. Cost: a format and a write; never called on a hot path.
 #pragma once
 
 #ifdef __ANDROID__
@@ -8,7 +8,7 @@
 #else
 #include "moka/base/Export.h"
 
-// The priorities that are used; the numbers are the platform's.
+/// The priorities that are used; the numbers are the platform's.
 enum android_LogPriority {
     ANDROID_LOG_DEBUG = 3,
     ANDROID_LOG_INFO = 4,
@@ -17,7 +17,7 @@ enum android_LogPriority {
     ANDROID_LOG_FATAL = 7,
 };
 
-// Returns the number of bytes written. A null tag or format is written as "(null)".
+/// Returns the number of bytes written. A null tag or format is written as "(null)".
 extern "C" MOKA_API int __android_log_print(int priority, char const* tag, char const* format, ...)
     __attribute__((format(printf, 3, 4)));
 #endif

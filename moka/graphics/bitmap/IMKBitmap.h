@@ -1,9 +1,9 @@
-// IMKBitmap: a GPU image that canvases draw into and drawables sample from.
-// Owner:   reference counted; what a creating function returns carries one reference for its caller.
-// Thread:  caller-side bitmaps from any thread, render-thread bitmaps on the render thread only. The tag is
-//          not synchronised.
-// What a bitmap can do is asked through the four capability getters, which return null for what it lacks;
-// nobody casts.
+/// IMKBitmap: a GPU image that canvases draw into and drawables sample from.
+/// Owner:   reference counted; a creating function returns one reference.
+/// Thread:  caller-side bitmaps from any thread, render-thread bitmaps on the render thread only. The tag is
+///          not synchronised.
+/// The four capability getters say what a bitmap can do: each returns null for a capability that it lacks;
+/// nobody casts.
 #pragma once
 
 #include "moka/graphics/bitmap/IMKBitmapDataGettable.h"
@@ -18,25 +18,29 @@ class IMKTextureBitmap;
 
 class IMKBitmap : public IMKBitmapDataGettable {
 public:
+    /// The bitmap's rectangle, in pixels. Only a screen bitmap may lie off the origin.
     virtual int GetX() const = 0;
     virtual int GetY() const = 0;
     virtual int GetWidth() const = 0;
     virtual int GetHeight() const = 0;
     virtual Rect GetBitmapRect() = 0;
 
-    // A label for logs and GL debuggers; the first 126 bytes are kept, null is ignored.
+    /// A label for logs and GL debuggers; the first 126 bytes are kept, null is ignored.
     virtual void SetTag(char const* tag) = 0;
     virtual char const* GetTag() = 0;
 
-    // A caller-side bitmap over the same image, holding one reference; of a screen bitmap, over the other of the
-    // host's two frame buffers. Null without a queue and when memory runs out.
+    /// A caller-side bitmap over the same image, holding one reference; of a screen bitmap, over the other of
+    /// the host's two frame buffers. Null without a queue and when memory runs out.
     virtual IMKBitmap* Clone() = 0;
 
+    /// The queue that it was created with; may be null.
     virtual IGLMsgQueue* GetMsgQueue() = 0;
 
+    /// Takes or drops a reference; the count afterwards. The last Unref deletes the bitmap.
     virtual int Ref() = 0;
     virtual int Unref() = 0;
 
+    /// The capabilities: sampling, drawing onto it, canvases, strips. Null if it lacks one. No new reference.
     virtual IMKBitmapReadable* GetBitmapReadable() = 0;
     virtual IMKBitmapWritable* GetBitmapWritable() = 0;
     virtual IMKBitmapCanvasAttachable* GetBitmapCanvasAttachable() = 0;

@@ -1,4 +1,4 @@
-// CanvasChecker: what the checkers of plain and of pen canvases have in common; see Checker.
+/// CanvasChecker: the common part of the checkers of both kinds of canvas; see Checker.
 #pragma once
 
 #include "moka/graphics/canvas/IMKCanvasBase.h"
@@ -6,29 +6,35 @@
 
 namespace Moka::detail {
 
-// Ends the process in the way of a call to a pure virtual function.
+/// Ends the process in the way of a call to a pure virtual function.
 [[noreturn]] MOKA_API void EndAsPureVirtual();
 
 template <class Interface>
 class MOKA_API CanvasChecker : public Checker<Interface> {
 public:
+    /// As IMKCanvasBase.
     using ClipOp = IMKCanvasBase::ClipOp;
     using SaveFlag = IMKCanvasBase::SaveFlag;
 
+    /// Forwards while referenced.
     void Clear(int argb) override { Checked().Clear(argb); }
     void Clear(float r, float g, float b, float a) override { Checked().Clear(r, g, b, a); }
     void ClearAll(int argb) override { Checked().ClearAll(argb); }
     void ClearAll(float r, float g, float b, float a) override { Checked().ClearAll(r, g, b, a); }
 
+    /// Forwards while referenced.
     int Save(SaveFlag flag) override { return Checked().Save(flag); }
     void Restore(int level) override { Checked().Restore(level); }
     void SetClipRect(int x, int y, int width, int height, ClipOp op) override {
         Checked().SetClipRect(x, y, width, height, op);
     }
 
+    /// Forwards while referenced.
     void SetMatrix(Matrix3<float> const& m) override { Checked().SetMatrix(m); }
-    // Ends the process. // Compat: checker-pure
+    /// Ends the process.
+    // Compat: checker-pure
     Matrix3<float> GetMatrix() override { EndAsPureVirtual(); }
+    /// Forwards while referenced.
     void PreConcat(Matrix3<float> const& m) override { Checked().PreConcat(m); }
     void PostConcat(Matrix3<float> const& m) override { Checked().PostConcat(m); }
     void PreScale(float sx, float sy) override { Checked().PreScale(sx, sy); }
@@ -40,7 +46,8 @@ public:
     void PreTranslate(float tx, float ty) override { Checked().PreTranslate(tx, ty); }
     void PostTranslate(float tx, float ty) override { Checked().PostTranslate(tx, ty); }
 
-    // The tag set through the checker, not the canvas's own. // Compat: checker-tag
+    /// The tag set through the checker, not the canvas's own.
+    // Compat: checker-tag
     char const* GetTag() override {
         this->checkRefCount();
         return this->GetOwnTag();

@@ -1,17 +1,17 @@
-// Checker: a stand-in for an object that counts the references going through it, so that a use after the last
-// Unref is met here, and not in freed memory. A debugging aid: code that suspects such a use hands out the
-// checker in the object's place; the library itself makes none.
-//
-//     MKBitmapChecker     Checker<IMKBitmap>
-//     MKCanvasChecker     CanvasChecker<IMKCanvas>, over Checker<IMKCanvas>
-//     MKPenCanvasChecker  CanvasChecker<IMKPenCanvas>, over Checker<IMKPenCanvas>
-//
-// Owner:  whoever made it deletes it. It holds none of the object's references, and stays alive at a count of
-//         zero, to refuse. Its own count starts at one.
-// Thread: the object's own rules. Counting is exact from any thread, but a use that races with the last Unref
-//         may still get through.
-// Fails:  with a count of zero every operation leaves the object alone, logs its address and the tag, and
-//         throws std::logic_error.
+/// Checker: wraps an object and counts the references that go through it. A use after the last Unref fails
+/// here, and not in freed memory. A debugging aid: code that suspects such a use hands out the checker
+/// instead of the object; the library itself creates none.
+///
+///     MKBitmapChecker     Checker<IMKBitmap>
+///     MKCanvasChecker     CanvasChecker<IMKCanvas>, over Checker<IMKCanvas>
+///     MKPenCanvasChecker  CanvasChecker<IMKPenCanvas>, over Checker<IMKPenCanvas>
+///
+/// Owner:  the creator deletes it. It holds none of the object's references, and stays alive at a count of
+///         zero, to refuse. Its own count starts at one.
+/// Thread: the object's own rules. Counting is exact from any thread, but a use that races with the last
+///         Unref may still get through.
+/// Fails:  with a count of zero every operation leaves the object alone, logs its address and the tag, and
+///         throws std::logic_error.
 #pragma once
 
 #include "moka/base/CriticalSection.h"
@@ -28,28 +28,29 @@ class IMKCanvasBase;
 
 namespace detail {
 
-// Log the line and throw; neither touches the object.
+/// Log the line and throw; neither touches the object.
 [[noreturn]] MOKA_API void FailReleased(IMKBitmap const* bitmap, char const* tag, int refCount);
 [[noreturn]] MOKA_API void FailReleased(IMKCanvasBase const* canvas, char const* tag, int refCount);
 
 template <class Interface>
 class MOKA_API Checker : public Interface {
 public:
-    // Fails unless the count is above zero.
+    /// Fails unless the count is above zero.
     void checkRefCount() const {
         if (int const count = mRefCount; count <= 0) FailReleased(mWrapped, mTag.Get(), count);
     }
 
-    // The object gets the whole tag; the checker keeps the first 126 bytes for its own messages.
+    /// The object gets the whole tag; the checker keeps the first 126 bytes for its own messages.
     void SetTag(char const* tag) override {
         checkRefCount();
         mTag.Set(tag);
         mWrapped->SetTag(tag);
     }
 
+    /// Forwards while referenced.
     IGLMsgQueue* GetMsgQueue() override { return Checked().GetMsgQueue(); }
 
-    // Forwarded with the lock left: the object may go with its last reference, and run anything.
+    /// Forwards without the lock: the last reference may delete the object and run other code.
     int Ref() override {
         ChangeCount(1);
         return mWrapped->Ref();
@@ -60,14 +61,16 @@ public:
     }
 
 protected:
+    /// wrapped is not null and not owned.
     explicit Checker(Interface* wrapped) : mLock(false), mWrapped(wrapped) {}
 
-    // The way to the object for every operation that only forwards.
+    /// The way to the object for every operation that only forwards.
     Interface& Checked() const {
         checkRefCount();
         return *mWrapped;
     }
 
+    /// The tag set through the checker.
     char const* GetOwnTag() const { return mTag.Get(); }
 
 private:

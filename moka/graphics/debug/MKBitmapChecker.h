@@ -1,6 +1,6 @@
-// MKBitmapChecker: a bitmap that hands every call on to another one while it is referenced, and throws
-// "Bitmap was already released!!" afterwards. Owner, Thread, Fails: see Checker.h.
-// The capabilities and clones that it returns are the wrapped bitmap's own, and unchecked.
+/// MKBitmapChecker: a bitmap that hands every call on to another one while it is referenced, and throws
+/// "Bitmap was already released!!" afterwards. Owner, Thread, Fails: see Checker.h.
+/// The capabilities and clones that it returns are the wrapped bitmap's own, and unchecked.
 #pragma once
 
 #include "moka/graphics/bitmap/IMKBitmap.h"
@@ -10,9 +10,10 @@ namespace Moka {
 
 class MOKA_API MKBitmapChecker final : public detail::Checker<IMKBitmap> {
 public:
-    explicit MKBitmapChecker(IMKBitmap* bitmap); // not null, not owned
+    explicit MKBitmapChecker(IMKBitmap* bitmap); ///< not null, not owned
     ~MKBitmapChecker() override;
 
+    /// Forward while referenced.
     unsigned int GetPixel(Point const& p) override { return Checked().GetPixel(p); }
     void GetPixelAsync(Point const& p, void* userData, PixelCallback callback) override {
         Checked().GetPixelAsync(p, userData, callback);
@@ -23,15 +24,17 @@ public:
         Checked().GetBitmapDataAsync(r, destination, userData, callback);
     }
 
+    /// Forward while referenced.
     int GetX() const override { return Checked().GetX(); }
     int GetY() const override { return Checked().GetY(); }
     int GetWidth() const override { return Checked().GetWidth(); }
     int GetHeight() const override { return Checked().GetHeight(); }
     Rect GetBitmapRect() override { return Checked().GetBitmapRect(); }
 
-    char const* GetTag() override { return Checked().GetTag(); } // a canvas checker answers with its own
+    char const* GetTag() override { return Checked().GetTag(); } ///< a canvas checker answers with its own
     IMKBitmap* Clone() override { return Checked().Clone(); }
 
+    /// Forward while referenced.
     IMKBitmapReadable* GetBitmapReadable() override { return Checked().GetBitmapReadable(); }
     IMKBitmapWritable* GetBitmapWritable() override { return Checked().GetBitmapWritable(); }
     IMKBitmapCanvasAttachable* GetBitmapCanvasAttachable() override {

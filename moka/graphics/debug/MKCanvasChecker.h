@@ -1,6 +1,7 @@
-// MKCanvasChecker: a canvas that hands every call on to another one while it is referenced, and throws
-// "Canvas was already released!!" afterwards. Owner, Thread, Fails: see Checker.h.
-// GetMatrix and GetBitmap end the process, as calls to pure virtual functions do. // Compat: checker-pure
+/// MKCanvasChecker: a canvas that hands every call on to another one while it is referenced, and throws
+/// "Canvas was already released!!" afterwards. Owner, Thread, Fails: see Checker.h.
+/// GetMatrix and GetBitmap end the process, as calls to pure virtual functions do.
+// Compat: checker-pure
 #pragma once
 
 #include "moka/graphics/canvas/IMKCanvas.h"
@@ -10,11 +11,13 @@ namespace Moka {
 
 class MOKA_API MKCanvasChecker final : public detail::CanvasChecker<IMKCanvas> {
 public:
-    explicit MKCanvasChecker(IMKCanvas* canvas); // not null, not owned
+    explicit MKCanvasChecker(IMKCanvas* canvas); ///< not null, not owned
     ~MKCanvasChecker() override;
 
+    /// Ends the process.
     IMKBitmap* GetBitmap() override { detail::EndAsPureVirtual(); }
 
+    /// Forwards while referenced.
     void Draw(IMKCustomDrawable* drawable, MKPaint const* paint) override { Checked().Draw(drawable, paint); }
 
     void DrawLine(float x1, float y1, float x2, float y2, MKPaint const* paint) override {

@@ -1,7 +1,8 @@
-// MKPenCanvasChecker: a pen canvas that hands every call on to another one while it is referenced, and throws
-// "Canvas was already released!!" afterwards. Owner, Thread, Fails: see Checker.h.
-// GetMatrix ends the process, as a call to a pure virtual function does; GetBitmap forwards.
-// // Compat: checker-pure
+/// MKPenCanvasChecker: a pen canvas that hands every call on to another one while it is referenced, and throws
+/// "Canvas was already released!!" afterwards. Owner, Thread, Fails: see Checker.h.
+/// GetMatrix ends the process, as a call to a pure virtual function does; GetBitmap forwards.
+///
+// Compat: checker-pure
 #pragma once
 
 #include "moka/graphics/canvas/IMKPenCanvas.h"
@@ -11,9 +12,10 @@ namespace Moka {
 
 class MOKA_API MKPenCanvasChecker final : public detail::CanvasChecker<IMKPenCanvas> {
 public:
-    explicit MKPenCanvasChecker(IMKPenCanvas* canvas); // not null, not owned
+    explicit MKPenCanvasChecker(IMKPenCanvas* canvas); ///< not null, not owned
     ~MKPenCanvasChecker() override;
 
+    /// Forwards while referenced.
     IMKBitmap* GetBitmap() override { return Checked().GetBitmap(); }
 
     Matrix3<float> GetModelMatrix() override { return Checked().GetModelMatrix(); }

@@ -1,7 +1,7 @@
-// IMKCustomDrawable: something that draws itself onto a canvas: IMKCanvas::Draw() hands it over.
-// Owner:  reference counted; each request holds one reference until it has been drawn.
-// Thread: DrawRT on the render thread, the references from any.
-// The vtable order is ABI.
+/// IMKCustomDrawable: something that draws itself onto a canvas: IMKCanvas::Draw() hands it over.
+/// Owner:  reference counted; each request holds one reference until it has been drawn.
+/// Thread: DrawRT on the render thread, the references from any.
+/// The vtable order is ABI.
 #pragma once
 
 #include "moka/graphics/math/Matrix4.h"
@@ -12,8 +12,8 @@ class MKPaint;
 
 class IMKCustomDrawable {
 public:
-    // Called once for each frame buffer of the target, which is active, with its clip in force. projection
-    // maps the canvas's pixels to clip space.
+    /// Called once for each frame buffer of the target. It is active and its clip is set. projection
+    /// maps the canvas's pixels to clip space.
     virtual void DrawRT(Matrix4<float> const& projection, MKPaint const& paint) = 0;
     virtual int Ref() = 0;
     virtual int Unref() = 0;

@@ -1,7 +1,7 @@
-// MKBlendedBitmapDrawable: a part of two bitmaps, mixed: the paint's alpha is how far from the first to the
-// second, not an opacity; its colour and tint have no effect.
-// Units:  destination in the canvas's pixels; source in those of a bitmap of the given size, from its origin.
-// See CustomDrawable.h for ownership, threads and failures.
+/// MKBlendedBitmapDrawable: a part of two bitmaps, mixed: the paint's alpha is how far from the first to the
+/// second, not an opacity; its colour and tint have no effect.
+/// Units:  destination in the canvas's pixels; source in those of a bitmap of the given size, from its origin.
+/// See CustomDrawable.h for ownership, threads and failures.
 #pragma once
 
 #include "moka/base/Export.h"
@@ -14,20 +14,22 @@ class MKBlenderBitmapsShader;
 
 class MOKA_API MKBlendedBitmapDrawable final : public detail::CustomDrawable<MKBlenderBitmapsShader> {
 public:
-    // Takes over the caller's references on the bitmaps; the setters take their own. A size of 0 by 0 becomes
-    // that of the first bitmap at the next draw and stays so. // Compat: blend-size
+    /// Takes over the caller's references on the bitmaps; the setters take their own. A size of 0 by 0 becomes
+    /// that of the first bitmap at the next draw and stays so.
+    // Compat: blend-size
     MKBlendedBitmapDrawable(IGLMsgQueue* queue, IMKBitmap* first, IMKBitmap* second, RectF const& src,
                             RectF const& dst, float width, float height);
     ~MKBlendedBitmapDrawable() override;
 
-    // Each takes a reference of its own.
+    /// Each takes a reference of its own.
     void SetBitmapFirst(IMKBitmap* bitmap) { Hold(mBitmap, bitmap); }
     void SetBitmapSecond(IMKBitmap* bitmap) { Hold(mSecondBitmap, bitmap); }
 
-    // An empty rectangle draws nothing.
+    /// An empty rectangle draws nothing.
     void SetRects(RectF const& src, RectF const& dst);
     void SetSize(float width, float height);
 
+    /// The values set; no new reference.
     IMKBitmap* GetBitmapFirst() const { return mBitmap.Get(); }
     IMKBitmap* GetBitmapSecond() const { return mSecondBitmap.Get(); }
     RectF const& GetSrc() const { return mSrc; }

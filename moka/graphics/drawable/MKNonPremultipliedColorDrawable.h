@@ -1,6 +1,6 @@
-// MKNonPremultipliedColorDrawable: one bitmap over another, at the origin and in the size of the upper one,
-// as colour that is not premultiplied. Nothing is drawn until both are set.
-// See CustomDrawable.h for ownership, threads and failures.
+/// MKNonPremultipliedColorDrawable: one bitmap over another, at the origin and in the size of the upper one,
+/// as colour that is not premultiplied. Nothing is drawn until both are set.
+/// See CustomDrawable.h for ownership, threads and failures.
 #pragma once
 
 #include "moka/base/Export.h"
@@ -13,12 +13,14 @@ class MKNonPremultipliedColorShader;
 class MOKA_API MKNonPremultipliedColorDrawable final
     : public detail::CustomDrawable<MKNonPremultipliedColorShader> {
 public:
+    /// Draws nothing until it has its bitmaps.
     explicit MKNonPremultipliedColorDrawable(IGLMsgQueue* queue);
     ~MKNonPremultipliedColorDrawable() override;
 
-    // src over dst; takes a reference on each.
+    /// src over dst; takes a reference on each.
     void SetBitmap(IMKBitmap* src, IMKBitmap* dst);
 
+    /// The bitmaps set; no new reference.
     IMKBitmap* GetSrc() const { return mBitmap.Get(); }
     IMKBitmap* GetDst() const { return mSecondBitmap.Get(); }
 

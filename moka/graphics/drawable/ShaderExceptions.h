@@ -1,5 +1,5 @@
-// ShaderExceptions.h: a program and the code that sets its uniforms disagree: a mistake of the developer's,
-// met when the shader is made, or when a parameter is set that was never bound.
+/// ShaderExceptions.h: a program and the code that sets its uniforms disagree: a mistake of the developer's,
+/// thrown when the shader is created, or when a parameter is set that was never bound.
 #pragma once
 
 #include "moka/base/Export.h"
@@ -11,12 +11,14 @@ namespace Moka {
 
 namespace detail {
 
-// A message that needs no memory: a mistake is told in its own words also when that ran out. Cut at 127 bytes.
+/// A message that needs no memory: it is complete even without memory. Cut at 127 bytes.
 class ShaderMessage {
 public:
+    /// Copies text.
     explicit ShaderMessage(char const* text) noexcept {
         std::memcpy(mText, text, strnlen(text, sizeof mText - 1));
     }
+    /// The message.
     char const* Get() const noexcept { return mText; }
 
 private:
@@ -25,20 +27,23 @@ private:
 
 } // namespace detail
 
-// A uniform is of another type than the binding.
+/// A uniform is of another type than the binding.
 class MOKA_API InvalidArgumentException : public std::exception {
 public:
+    /// Copies message.
     explicit InvalidArgumentException(char const* message) noexcept : mMessage(message) {}
     ~InvalidArgumentException() override;
+    /// The message.
     char const* what() const noexcept override { return mMessage.Get(); }
 
 private:
     detail::ShaderMessage mMessage;
 };
 
-// A value for a binding that is bound to nothing.
+/// A value for a binding that is bound to nothing.
 class MOKA_API NotSupportedException : public std::exception {
 public:
+    /// Copies message.
     explicit NotSupportedException(char const* message) noexcept : mMessage(message) {}
     ~NotSupportedException() override;
     char const* what() const noexcept override { return mMessage.Get(); }

@@ -21,7 +21,11 @@ constexpr double kLeastCellPixels = 0.25;
 // A thinner segment counts as good as one that fades as little as this more.
 constexpr double kAsWide = 0.95;
 
-constexpr std::size_t kCellSegments = StrokeCell::kPoints - 1;
+// Points of a cell that has too many are left out if they are off by less, in device pixels; of a stroke that fades,
+// as much more as it fades.
+constexpr double kLoose = 1.0 / 24;
+
+constexpr std::size_t kCellPoints = StrokeCell::kPoints;
 
 std::size_t At(int index) { return static_cast<std::size_t>(index); }
 
@@ -245,22 +249,6 @@ void StrokeCells::MakeNode(int node, Square const& square) {
     MakePart(node, square, 0);
 }
 
-namespace {
-
-// Of segments in the order of their numbers: neighbours share a point.
-template <class Candidates>
-int CountPoints(Candidates begin, Candidates end) {
-    int points = 0;
-    int last = -2;
-    for (auto candidate = begin; candidate != end; ++candidate) {
-        points += candidate->segment == last + 1 ? 1 : 2;
-        last = candidate->segment;
-    }
-    return points;
-}
-
-} // namespace
-
 // Of the candidates from begin on those that count in the square are put behind them.
 void StrokeCells::MakePart(int node, Square const& square, std::size_t begin) {
     std::size_t const end = mCandidates.size();
@@ -287,65 +275,107 @@ void StrokeCells::MakePart(int node, Square const& square, std::size_t begin) {
                                                 IsBeaten(candidate, winner);
                                      }),
                       mCandidates.end());
-    bool const fits = CountPoints(from, mCandidates.end()) <= StrokeCell::kPoints;
-    if (fits || square.side <= kLeastCellPixels * mScale.fine) {
-        MakeCell(node, square, end);
+    Collect(end);
+    if (Thin() || square.side <= kLeastCellPixels * mScale.fine) {
+        MakeCell(node, square);
     } else {
         for (int i = 0; i < 4; ++i) MakePart(node, square.GetQuarter(i), end);
     }
     mCandidates.resize(end);
 }
 
-// Of candidates that do not fit into one cell the farthest are left out: it is the smallest that there is.
-void StrokeCells::MakeCell(int node, Square const& square, std::size_t begin) {
-    auto const from = mCandidates.begin() + static_cast<std::ptrdiff_t>(begin);
-    auto const isEarlier = [](Candidate const& a, Candidate const& b) { return a.segment < b.segment; };
-    if (CountPoints(from, mCandidates.end()) > StrokeCell::kPoints) {
-        auto const isNearer = [](Candidate const& a, Candidate const& b) { return a.most < b.most; };
-        std::size_t count = kCellSegments + 1;
-        do {
-            std::sort(from, mCandidates.end(), isNearer);
-            mCandidates.resize(std::min(mCandidates.size(), begin + --count));
-            std::sort(from, mCandidates.end(), isEarlier);
-        } while (CountPoints(from, mCandidates.end()) > StrokeCell::kPoints);
+// The points of the candidates from begin on, which are in the order of their numbers: neighbours share one.
+void StrokeCells::Collect(std::size_t begin) {
+    mPoints.clear();
+    int last = -2;
+    for (std::size_t i = begin; i < mCandidates.size(); ++i) {
+        int const number = mCandidates[i].segment;
+        StrokeSegment const& segment = mSegments[At(number)];
+        if (mPoints.empty() || number != last + 1) mPoints.push_back({segment.a, false});
+        mPoints.push_back({segment.b, true});
+        last = number;
     }
+}
+
+// Leaves out points between others until a cell has room for the rest. False if it has not.
+bool StrokeCells::Thin() {
+    while (mPoints.size() > kCellPoints) {
+        std::size_t found = 0;
+        double least = kLoose * mScale.fine;
+        for (std::size_t i = 1; i + 1 < mPoints.size(); ++i) {
+            if (!mPoints[i].isJoined || !mPoints[i + 1].isJoined) continue;
+            StrokeNode const& node = mPoints[i].node;
+            StrokeSegment const way{mPoints[i - 1].node, mPoints[i + 1].node};
+            auto const [distance, radius] = way.FindCenter(node.x, node.y);
+            double const width = 2 * way.GetGreatestRadius() / mScale.fine;
+            double const off =
+                std::max(distance, std::fabs(node.radius - radius)) * std::clamp(width, kThinnestStroke, 1.0);
+            if (off >= least) continue;
+            least = off;
+            found = i;
+        }
+        if (found == 0) return false;
+        mPoints.erase(mPoints.begin() + static_cast<std::ptrdiff_t>(found));
+    }
+    return true;
+}
+
+// Of points that do not fit into one cell, the smallest that there is, the farthest segments are left out.
+void StrokeCells::KeepNearest(Square const& square) {
+    double const x = square.x + square.side * 0.5;
+    double const y = square.y + square.side * 0.5;
+    while (mPoints.size() > kCellPoints) {
+        std::size_t farthest = 0;
+        double most = -std::numeric_limits<double>::infinity();
+        for (std::size_t i = 1; i < mPoints.size(); ++i) {
+            if (!mPoints[i].isJoined) continue;
+            double const edge = StrokeSegment{mPoints[i - 1].node, mPoints[i].node}.GetEdge(x, y);
+            if (edge <= most) continue;
+            most = edge;
+            farthest = i;
+        }
+        mPoints[farthest].isJoined = false;
+        DropSinglePoints();
+    }
+}
+
+// Those joined to no other.
+void StrokeCells::DropSinglePoints() {
+    std::size_t kept = 0;
+    for (std::size_t i = 0; i < mPoints.size(); ++i) {
+        bool const leads = i + 1 < mPoints.size() && mPoints[i + 1].isJoined;
+        if (mPoints[i].isJoined || leads) mPoints[kept++] = mPoints[i];
+    }
+    mPoints.resize(kept);
+}
+
+void StrokeCells::MakeCell(int node, Square const& square) {
+    KeepNearest(square);
     StrokeCell& cell = mCells[At(TakeCell(node))];
     cell = {};
     cell.x = static_cast<float>(square.x);
     cell.y = static_cast<float>(square.y);
     cell.side = static_cast<float>(square.side);
-    int points = 0;
-    int joined = 0;
-    auto const put = [&](StrokeNode const& point) {
-        float* const at = cell.points + std::ptrdiff_t{3} * points++;
-        at[0] = static_cast<float>(point.x - square.x);
-        at[1] = static_cast<float>(point.y - square.y);
-        at[2] = static_cast<float>(point.radius);
-    };
-    int last = -2;
-    for (std::size_t i = begin; i < mCandidates.size(); ++i) {
-        int const segment = mCandidates[i].segment;
-        if (points == 0 || segment != last + 1) put(mSegments[At(segment)].a);
-        joined |= 1 << (points - 1);
-        put(mSegments[At(segment)].b);
-        last = segment;
+    int bits = 0;
+    for (std::size_t i = 0; i < mPoints.size(); ++i) {
+        StrokeNode const& point = mPoints[i].node;
+        cell.points[3 * i] = static_cast<float>(point.x - square.x);
+        cell.points[3 * i + 1] = static_cast<float>(point.y - square.y);
+        cell.points[3 * i + 2] = static_cast<float>(point.radius);
+        if (!mPoints[i].isJoined) continue;
+        bits |= (1 << i >> 1) | FindHalves(square, {mPoints[i - 1].node, point});
     }
-    cell.segments = static_cast<float>(joined | FindHalves(square, begin));
+    cell.segments = static_cast<float>(bits);
 }
 
 // Of a segment that lies on one side of the diagonal, with its radius and its fringe.
-int StrokeCells::FindHalves(Square const& square, std::size_t begin) const {
+int StrokeCells::FindHalves(Square const& square, StrokeSegment const& segment) const {
     double const middle = square.x + square.y + square.side;
-    int halves = 0;
-    for (std::size_t i = begin; i < mCandidates.size(); ++i) {
-        StrokeSegment const& segment = mSegments[At(mCandidates[i].segment)];
-        double const a = segment.a.x + segment.a.y - middle;
-        double const b = segment.b.x + segment.b.y - middle;
-        double const reach = GetReach(segment, mScale) * 1.41422;
-        if (std::min(a, b) < reach) halves |= StrokeCell::kUpperLeft;
-        if (std::max(a, b) > -reach) halves |= StrokeCell::kLowerRight;
-    }
-    return halves;
+    double const a = segment.a.x + segment.a.y - middle;
+    double const b = segment.b.x + segment.b.y - middle;
+    double const reach = GetReach(segment, mScale) * 1.41422;
+    return (std::min(a, b) < reach ? StrokeCell::kUpperLeft : 0) |
+           (std::max(a, b) > -reach ? StrokeCell::kLowerRight : 0);
 }
 
 int StrokeCells::TakeCell(int node) {

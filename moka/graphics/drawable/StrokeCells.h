@@ -71,6 +71,11 @@ private:
         double most;  // at most; negative inside
     };
 
+    struct Point {
+        StrokeNode node;
+        bool isJoined; // to the one before
+    };
+
     Candidate Judge(int segment, Square const& square) const;
     double FindMost(Candidate const& candidate, Square const& square) const;
     bool IsOutside(Candidate const& candidate) const;
@@ -89,8 +94,12 @@ private:
 
     void MakeNode(int node, Square const& square);
     void MakePart(int node, Square const& square, std::size_t begin);
-    void MakeCell(int node, Square const& square, std::size_t begin);
-    int FindHalves(Square const& square, std::size_t begin) const;
+    void Collect(std::size_t begin);
+    bool Thin();
+    void KeepNearest(Square const& square);
+    void DropSinglePoints();
+    void MakeCell(int node, Square const& square);
+    int FindHalves(Square const& square, StrokeSegment const& segment) const;
     int TakeCell(int node);
 
     StrokeScale const mScale;
@@ -103,6 +112,7 @@ private:
     std::vector<int> mNextCell; // of the same node, or free
     int mFreeCell = kNone;
     std::vector<Candidate> mCandidates; // while cells are made
+    std::vector<Point> mPoints;         // of the cell that is made
 };
 
 } // namespace Moka::detail

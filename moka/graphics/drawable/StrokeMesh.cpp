@@ -9,7 +9,7 @@ namespace Moka::detail {
 namespace {
 
 // How far a point that is left out may be off, and how much its radius, in device pixels.
-constexpr double kTolerance = 1.0 / 24;
+constexpr double kStrokeTolerance = 1.0 / 24;
 
 } // namespace
 
@@ -41,7 +41,8 @@ void StrokeMesh::Take(StrokeNode const& point) {
 
 bool StrokeMesh::ReachesStraight(StrokeNode const& point) const {
     StrokeSegment const way{mKept, point};
-    double const tolerance = kTolerance * mScale.fine;
+    double const width = 2 * way.GetGreatestRadius() / mScale.fine;
+    double const tolerance = kStrokeTolerance * mScale.fine / std::clamp(width, kThinnestStroke, 1.0);
     return std::all_of(mOpen.begin(), mOpen.begin() + static_cast<std::ptrdiff_t>(mOpenCount),
                        [&](StrokeNode const& skipped) {
                            auto const [distance, radius] = way.FindCenter(skipped.x, skipped.y);

@@ -8,6 +8,9 @@
 
 namespace Moka::detail {
 
+// A stroke thinner than a device pixel fades, and shows deviations less; down to this width.
+constexpr double kThinnestStroke = 0.25;
+
 struct StrokeNode {
     double x;
     double y;

@@ -1,16 +1,17 @@
-// BitmapsAndCanvases: named functions over MKGraphicsFactory, whose results count their references themselves.
-//     auto bitmap = NewBitmap(*queue, 400, 400);
-//     auto canvas = NewCanvas(*queue, bitmap);
-//     canvas->DrawCircle(200, 200, 100, nullptr);
-//     SaveBitmap(*bitmap, "circle.png");
-// Owner:  the returned pointer holds the first reference; copies of it hold more. Pixels are copied, or taken
-//         over where the parameter says so.
-// Thread: UseFrom says where the result will be used. For AnyThread any thread may call, and the work is posted
-//         to queue. For RenderThread only queue's render thread may. ReadBitmap and SaveBitmap wait for the
-//         render thread, so a task must not call them with a bitmap for AnyThread.
-// Units:  pixels; RGBA8, premultiplied. Paths are the bytes of a file's name.
-// Fails:  with a null pointer or false, and one error line, as MKGraphicsFactory and BitmapFactory do. A null
-//         bitmap gives a null canvas.
+/// BitmapsAndCanvases: named functions over MKGraphicsFactory, whose results count their references
+/// themselves.
+///     auto bitmap = NewBitmap(*queue, 400, 400);
+///     auto canvas = NewCanvas(*queue, bitmap);
+///     canvas->DrawCircle(200, 200, 100, nullptr);
+///     SaveBitmap(*bitmap, "circle.png");
+/// Owner:  the returned pointer holds the first reference; copies of it hold more. Pixels are copied, or
+///         taken over where the parameter says so.
+/// Thread: UseFrom says where the result will be used. For AnyThread any thread may call, and the work is
+///         posted to queue. For RenderThread only queue's render thread may. ReadBitmap and SaveBitmap wait
+///         for the render thread, so a task must not call them with a bitmap for AnyThread.
+/// Units:  pixels; RGBA8, premultiplied. Paths are the bytes of a file's name.
+/// Fails:  with a null pointer or false, and log an error, as MKGraphicsFactory and BitmapFactory do. A null
+///         bitmap gives a null canvas.
 #pragma once
 
 #include "moka/base/Bitmap.h"
@@ -33,23 +34,24 @@
 
 namespace Moka {
 
-enum class UseFrom { RenderThread, AnyThread }; // in the factory's order: without and with the queue
+/// Where an object is used. The order is the factory's: without and with the queue.
+enum class UseFrom { RenderThread, AnyThread }; ///< in the factory's order: without and with the queue
 
-// From tightly packed pixels, which stay the caller's and valid until the render thread has uploaded them.
+/// From tightly packed pixels, which stay the caller's and valid until the render thread has uploaded them.
 inline RefPtr<IMKBitmap> NewBitmap(IGLMsgQueue& queue, int width, int height, void const* pixels,
                                    UseFrom from = UseFrom::AnyThread) {
     return RefPtr<IMKBitmap>::Adopt(
         MKGraphicsFactory::CreateBitmap(&queue, width, height, pixels, false, static_cast<int>(from), false));
 }
 
-// Transparent.
+/// Transparent.
 inline RefPtr<IMKBitmap> NewBitmap(IGLMsgQueue& queue, int width, int height,
                                    UseFrom from = UseFrom::AnyThread) {
     return NewBitmap(queue, width, height, nullptr, from);
 }
 
-// From image, whose pixels it takes over. They are copied only if image does not own them, or if its rows are
-// not tightly packed. Null, without a message, when image is.
+/// Takes over the pixels of image. They are copied only if image does not own them, or if its rows are
+/// not tightly packed. Null, without a message, when image is.
 inline RefPtr<IMKBitmap> NewBitmap(IGLMsgQueue& queue, std::unique_ptr<Bitmap> image,
                                    UseFrom from = UseFrom::AnyThread) {
     if (!image) return {};
@@ -67,41 +69,44 @@ inline RefPtr<IMKBitmap> NewBitmap(IGLMsgQueue& queue, std::unique_ptr<Bitmap> i
     return bitmap;
 }
 
-// Over the host's default frame buffer, for instance a window's.
+/// Over the host's default frame buffer, for instance a window's.
 inline RefPtr<IMKBitmap> NewScreenBitmap(IGLMsgQueue& queue, int width, int height,
                                          UseFrom from = UseFrom::AnyThread) {
     return RefPtr<IMKBitmap>::Adopt(
         MKGraphicsFactory::CreateScreenBitmap(&queue, 0, 0, width, height, 1, static_cast<int>(from)));
 }
 
-// Another bitmap over the same image, which it keeps alive.
+/// Another bitmap over the same image, which it keeps alive.
 inline RefPtr<IMKBitmap> NewSharedBitmap(IGLMsgQueue& queue, RefPtr<IMKBitmap> const& parent,
                                          UseFrom from = UseFrom::AnyThread) {
     return RefPtr<IMKBitmap>::Adopt(
         MKGraphicsFactory::CreateBitmap(&queue, parent.Get(), static_cast<int>(from)));
 }
 
-// The canvas keeps target alive.
+/// The canvas keeps target alive.
 inline RefPtr<IMKCanvas> NewCanvas(IGLMsgQueue& queue, IMKBitmap* target, UseFrom from = UseFrom::AnyThread) {
     return RefPtr<IMKCanvas>::Adopt(MKGraphicsFactory::CreateCanvas(&queue, target, static_cast<int>(from)));
 }
+/// The canvas keeps target alive.
 inline RefPtr<IMKCanvas> NewCanvas(IGLMsgQueue& queue, RefPtr<IMKBitmap> const& target,
                                    UseFrom from = UseFrom::AnyThread) {
     return NewCanvas(queue, target.Get(), from);
 }
 
+/// A canvas for external GL code. It keeps target alive.
 inline RefPtr<IMKPenCanvas> NewPenCanvas(IGLMsgQueue& queue, IMKBitmap* target,
                                          UseFrom from = UseFrom::AnyThread) {
     return RefPtr<IMKPenCanvas>::Adopt(
         MKGraphicsFactory::CreatePenCanvas(&queue, target, static_cast<int>(from)));
 }
+/// A canvas for external GL code. It keeps target alive.
 inline RefPtr<IMKPenCanvas> NewPenCanvas(IGLMsgQueue& queue, RefPtr<IMKBitmap> const& target,
                                          UseFrom from = UseFrom::AnyThread) {
     return NewPenCanvas(queue, target.Get(), from);
 }
 
-// From a PNG, JPEG, WebP or mki file, by the base library's codecs, on this thread and also where Java has
-// decoders. reason, if given, is filled with what is wrong with the file.
+/// From a PNG, JPEG, WebP or mki file, by the base library's codecs, on this thread and also where Java has
+/// decoders. reason, if given, is set to the fault of the file.
 inline RefPtr<IMKBitmap> LoadBitmap(IGLMsgQueue& queue, std::string const& path,
                                     std::string* reason = nullptr, UseFrom from = UseFrom::AnyThread) {
     String const name = String::FromFileName(path);
@@ -109,8 +114,8 @@ inline RefPtr<IMKBitmap> LoadBitmap(IGLMsgQueue& queue, std::string const& path,
     return NewBitmap(queue, std::move(image), from);
 }
 
-// The bitmap's pixels, when everything that was posted before has been drawn. Null without memory, or if the queue
-// refuses, for instance because it was stopped.
+/// The bitmap's pixels, when everything that was posted before has been drawn. Null without memory, or if the
+/// queue refuses, for instance because it was stopped.
 inline std::unique_ptr<Bitmap> ReadBitmap(IMKBitmap& bitmap) {
     int const width = bitmap.GetWidth();
     int const height = bitmap.GetHeight();
@@ -123,7 +128,7 @@ inline std::unique_ptr<Bitmap> ReadBitmap(IMKBitmap& bitmap) {
     // The reading has no result. A pixel that is read into its opposite and stays that has not been read.
     unsigned char opposite[4];
     unsigned char probe[4];
-    for (int i = 0; i < 4; ++i) opposite[i] = probe[i] = static_cast<unsigned char>(~pixels[i]);
+    for (std::size_t i = 0; i < 4; ++i) opposite[i] = probe[i] = static_cast<unsigned char>(~pixels[i]);
     Rect const all = bitmap.GetBitmapRect();
     bitmap.GetBitmapData(Rect(all.left, all.top, all.left + 1, all.top + 1), probe);
     if (std::equal(probe, probe + 4, opposite)) return nullptr;
@@ -132,8 +137,8 @@ inline std::unique_ptr<Bitmap> ReadBitmap(IMKBitmap& bitmap) {
     return image;
 }
 
-// Into a file whose format its extension says; see BitmapFactory::SaveBitmap for quality. reason, if given, is
-// filled with why it could not be saved.
+/// Into a file whose format its extension says; see BitmapFactory::SaveBitmap for quality. reason, if given,
+/// is filled with why it could not be saved.
 inline bool SaveBitmap(IMKBitmap& bitmap, std::string const& path, int quality = 100,
                        std::string* reason = nullptr) {
     std::unique_ptr<Bitmap> const image = ReadBitmap(bitmap);

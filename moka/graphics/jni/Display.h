@@ -1,6 +1,6 @@
-// Display: the record behind a Java MokaDisplay, whose handle is this object's address.
-// Owner:  whoever made it; a Java MokaDisplay owns the one it made.
-// Thread: not synchronised.
+/// Display: the record behind a Java MokaDisplay, whose handle is this object's address.
+/// Owner:  the creator; a Java MokaDisplay owns the one that it created.
+/// Thread: not synchronised.
 #pragma once
 
 #include "moka/base/Export.h"
@@ -10,12 +10,14 @@ namespace Moka {
 
 class MOKA_API Display : public IDisplay {
 public:
+    /// Stores the values; see IDisplay.
     Display(int widthPixels, int heightPixels, float systemDensity, int localWidthPixels,
             int localHeightPixels, float density, float scaledDensity, int densityDpi, float xdpi, float ydpi,
             LayoutDirection layoutDirection, Orientation orientation, ScreenOrientation screenOrientation,
             bool isTablet, bool isUWP, long long appVsyncOffsetNanos);
     ~Display() override;
 
+    /// See IDisplay.
     int GetDebugLevel() const override { return mDebugLevel; }
     int GetWidthPixels() const override { return mWidthPixels; }
     int GetHeightPixels() const override { return mHeightPixels; }
@@ -35,8 +37,9 @@ public:
     bool IsUWP() const override { return mIsUWP; }
     long long GetAppVsyncOffsetNanos() const override { return mAppVsyncOffsetNanos; }
 
-    // Copies the values that source's getters return, except the dots per inch and IsTablet. A null source
-    // changes nothing. // Compat: display-copy
+    /// Copies the values that source's getters return, except the dots per inch and IsTablet. A null source
+    /// changes nothing.
+    // Compat: display-copy
     void Copy(Display const* source);
     void UpdateScreenOrientation(ScreenOrientation orientation) { mScreenOrientation = orientation; }
     void SetDebugLevel(int level) { mDebugLevel = level; }

@@ -1,34 +1,35 @@
-// IDisplay: the device's screen as the Java side describes it, for native code to read. Sizes are in pixels,
-// densities are factors unless named dpi. The vtable order is ABI.
+/// IDisplay: the device's screen as the Java side describes it, for native code to read. Sizes are in pixels,
+/// densities are factors unless named dpi. The vtable order is ABI.
 #pragma once
 
 namespace Moka {
 
 class IDisplay {
 public:
-    // Java's numbers, handed on as they come; what each one means is Java's business.
+    /// Numbers from Java, unchanged; Java defines their meaning.
     enum class LayoutDirection : int {};
     enum class Orientation : int {};
     enum class ScreenOrientation : int {};
 
     virtual ~IDisplay() = default;
 
+    /// The debug level, and the screen's size.
     virtual int GetDebugLevel() const = 0;
     virtual int GetWidthPixels() const = 0;
     virtual int GetHeightPixels() const = 0;
-    // The application's own area.
+    /// The application's own area.
     virtual int GetLocalWidthPixels() const = 0;
     virtual int GetLocalHeightPixels() const = 0;
     virtual float GetSystemDensity() const = 0;
     virtual float GetDensity() const = 0;
-    virtual float GetScaledDensity() const = 0; // for fonts
+    virtual float GetScaledDensity() const = 0; ///< for fonts
     virtual int GetDensityDpi() const = 0;
     virtual float GetXdpi() const = 0;
     virtual float GetYdpi() const = 0;
     virtual LayoutDirection GetLayoutDirection() const = 0;
     virtual Orientation GetOrientation() const = 0;
     virtual ScreenOrientation GetScreenOrientation() const = 0;
-    // Whether the shorter side of the application's area is at least 512 at density 1.
+    /// Whether the shorter side of the application's area is at least 512 at density 1.
     virtual bool IsTabletUX() const = 0;
     virtual bool IsTablet() const = 0;
     virtual bool IsUWP() const = 0;

@@ -1,10 +1,10 @@
-// BitmapLoaderInterface: whom the loader tells about loads and saves.
-// Owner:  whoever implements it; the loader keeps a plain pointer until the request is over.
-// Thread: everything is called on the loader's thread. OnCallbackPending comes first, inside the loader's
-//         lock: it must not wait for anything that another thread does with the loader. Then one result, then
-//         OnCallbackCompleted, both with no lock held. After OnCallbackCompleted nothing touches the
-//         listener.
-// Fails:  an exception out of an operation is one error line; the rest of the sequence still comes.
+/// BitmapLoaderInterface: receives the results of loads and saves.
+/// Owner:  the implementer; the loader keeps a plain pointer until the request is over.
+/// Thread: everything is called on the loader's thread. OnCallbackPending comes first, inside the loader's
+///         lock: it must not wait for anything that another thread does with the loader. Then one result,
+///         then OnCallbackCompleted, both with no lock held. After OnCallbackCompleted nothing touches the
+///         listener.
+/// Fails:  an exception of an operation is logged as an error; the rest of the sequence is still called.
 #pragma once
 
 #include "moka/base/Export.h"
@@ -19,19 +19,21 @@ class String;
 
 class MOKA_API BitmapLoaderInterface {
 public:
-    // A CPU bitmap stays valid until the render thread has run what is posted to the request's queue now; a
-    // GPU bitmap until the call returns, unless the listener takes a reference of its own.
+    /// A CPU bitmap stays valid until the render thread has run what is posted to the request's queue now; a
+    /// GPU bitmap until the call returns, unless the listener takes a reference of its own.
     virtual void OnLoad(int id, String const& path, Bitmap& bitmap);
     virtual void OnLoad(int id, String const& path, IMKBitmap& bitmap);
 
-    // For listeners that deliver lists; the loader itself never calls them.
+    /// For listeners that deliver lists; the loader itself never calls them.
     virtual void OnLoadList(int id, String const& path, std::vector<Bitmap*>& bitmaps);
     virtual void OnLoadList(int id, String const& path, std::vector<IMKBitmap*>& bitmaps);
 
+    /// The file could not be read; the file was written; it could not be.
     virtual void OnLoadError(int id, String const& path) = 0;
     virtual void OnSave(int id, String const& path, void* userData) = 0;
     virtual void OnSaveError(int id, String const& path, void* userData) = 0;
 
+    /// Before and after the result; see above.
     virtual void OnCallbackPending() = 0;
     virtual void OnCallbackCompleted() = 0;
 

@@ -1,13 +1,14 @@
-// MKBitmapSaveManager: saves GPU bitmaps to files, counts the saves in flight, and hands each result to the
-// thread that made the manager, or to a thread that waits for it.
-// Owner:   the caller. Make it on a thread with a MessageLoop; without one, results come only to those who
-//          wait.
-// Thread:  requests, waits and the count from any. Results are handed over on the message loop's thread or on
-//          a waiting one, one at a time, with the manager's lock held: they may request further saves, but
-//          neither wait for the manager nor destroy it.
-// Destroy: from any thread. Saves in flight still write their files; results not yet handed over are dropped.
-// Fails:   see RequestSave. The event loop of the loader must be running
-//          (MKBitmapLoader::startEventLoopBySelf).
+/// MKBitmapSaveManager: saves GPU bitmaps to files, counts the saves in flight, and hands each result to the
+/// thread that created the manager, or to a thread that waits for it.
+/// Owner:   the caller. Create it on a thread with a MessageLoop; without one, results come only to those who
+///          wait.
+/// Thread:  requests, waits and the count from any. Results are handed over on the message loop's thread or
+///          on a waiting one, one at a time, with the manager's lock held: they may request further saves,
+///          but neither wait for the manager nor destroy it.
+/// Destroy: from any thread. Saves in flight still write their files; results not yet handed over are
+///          dropped.
+/// Fails:   see RequestSave. The event loop of the loader must be running
+///          (MKBitmapLoader::startEventLoopBySelf).
 #pragma once
 
 #include "moka/base/ConditionalVariable.h"
@@ -29,8 +30,9 @@ class MKBitmapLoader;
 
 class MOKA_API MKBitmapSaveManager : NonAssignable {
 public:
-    // Copied with each request. Either function may be null.
+    /// Copied with each request. Either function may be null.
     struct SaveCallback {
+        /// The results of a save; context and userData are passed to both.
         void (*onSaveSucceeded)(void* context, String const* path, void* userData) = nullptr;
         void (*onSaveFailed)(void* context, String const* path, void* userData) = nullptr;
         void* context = nullptr;
@@ -40,17 +42,17 @@ public:
     MKBitmapSaveManager();
     virtual ~MKBitmapSaveManager();
 
-    // callback may be null; the save counts all the same. False for an empty bitmap and when memory runs out;
-    // a refused request stays counted, and waiting for the manager then never ends. So does a save whose
-    // read-back the bitmap's queue refuses.
+    /// callback may be null; the save counts all the same. False for an empty bitmap and when memory runs
+    /// out; a refused request stays counted, and waiting for the manager then never ends. So does a save
+    /// whose read-back the bitmap's queue refuses.
     bool RequestSave(int id, String const& path, IMKBitmap& bitmap, SaveCallback* callback,
                      int quality) const;
 
-    // Saves requested whose result has not been handed over.
+    /// Saves requested whose result has not been handed over.
     int GetRequestSaveCount() const { return mSaveCount; }
 
-    // Hands over results on the calling thread until none is missing. queue is the one of the bitmaps, or
-    // null. Never on the render thread or the loader's.
+    /// Hands over results on the calling thread until none is missing. queue is the one of the bitmaps, or
+    /// null. Never on the render thread or the loader's.
     void WaitForSaveCompleting(IGLMsgQueue* queue);
 
 private:

@@ -1,9 +1,9 @@
-// MKPaint: how a primitive is drawn: colour, tint, blending, fill or stroke, line, dashes, texture tiling.
-// A value: copied member by member, holds no resources. A draw call takes its own copy.
-// Thread: one at a time, like any value.
-// Units:  colour components 0 ... 1, not premultiplied; lengths in pixels. Nothing is checked: every setter
-//         stores what it is given.
-// A new paint is opaque white, source-over, filled, one pixel wide, not anti-aliased and not dashed.
+/// MKPaint: how a primitive is drawn: colour, tint, blending, fill or stroke, line, dashes, texture tiling.
+/// A value: copied member by member, holds no resources. A draw call takes its own copy.
+/// Thread: one at a time, like any value.
+/// Units:  colour components 0 ... 1, not premultiplied; lengths in pixels. Nothing is checked: every setter
+///         stores its argument.
+/// A new paint is opaque white, source-over, filled, one pixel wide, not anti-aliased and not dashed.
 #pragma once
 
 #include "moka/base/Export.h"
@@ -13,7 +13,7 @@ namespace Moka {
 
 class MOKA_API MKPaint {
 public:
-    // How source and destination become the pixel. The numbers of all four enumerations are the interface.
+    /// How source and destination are combined. The numbers of all four enumerations are ABI.
     enum XFermode : int {
         Add = 0,
         Clear = 1,
@@ -27,62 +27,69 @@ public:
         SrcAtop = 9,
         SrcIn = 10,
         SrcOut = 11,
-        SrcOver = 12, // premultiplied; any other number, negative ones included, means this
+        SrcOver = 12, ///< premultiplied; any other number, negative ones included, means this
         SrcKeepDstAlpha = 13,
         SrcNonPremultiplied = 14,
         SrcOverNonPremultiplied = 15,
-        Darken = 16,  // of bitmaps; anything else is drawn as with Src
-        Lighten = 17, // of bitmaps; anything else is drawn as with Src
+        Darken = 16,  ///< for bitmaps; other shapes as Src
+        Lighten = 17, ///< for bitmaps; other shapes as Src
         BlendingOff = 18,
     };
 
-    // The stroke lies over the fill. Any other number draws nothing.
+    /// The stroke lies over the fill. Any other number draws nothing.
     enum Style : int { Fill = 0, FillAndStroke = 1, Stroke = 2 };
 
+    /// The ends of a line, and of each dash.
     enum LineCapType : int {
-        Butt = 0,   // the line ends at its end point
-        Round = 1,  // half a disc around the end point
-        Square = 2, // extended by half the width; also what any other number means
+        Butt = 0,   ///< the line ends at its end point
+        Round = 1,  ///< half a disc around the end point
+        Square = 2, ///< extended by half the width; any other number means this
     };
 
-    // How a texture goes on outside itself. Default is Clamp.
+    /// The content outside a texture. Default is Clamp.
     enum TileMode : int { Default = 0, Clamp = 1, Mirror = 2, Repeat = 3 };
 
     MKPaint() = default;
+    /// Copies all values.
     MKPaint(MKPaint const&) = default;
     MKPaint& operator=(MKPaint const&) = default;
     virtual ~MKPaint();
 
-    void SetColor(int argb); // 0xAARRGGBB
+    /// The colour, not premultiplied. Three components leave the alpha as it is.
+    void SetColor(int argb); ///< 0xAARRGGBB
     void SetColor(float r, float g, float b) { mColor = {r, g, b, mColor.w}; }
     void SetColor(float r, float g, float b, float a) { mColor = {r, g, b, a}; }
     Vector4<float> GetColor() const { return mColor; }
 
-    // Replaces the colours of what is drawn; its shape and alpha stay.
+    /// The tint replaces the colours of a bitmap or shape and keeps its alpha.
     void SetTintColor(int argb);
     void SetTintColor(float r, float g, float b, float a);
     Vector4<float> GetTintColor() const { return mTintColor; }
     void ClearTintColor();
     bool HasTintColor() const { return mHasTintColor; }
 
-    // The colour's own alpha; there is no other.
+    /// The colour's own alpha; there is no other.
     void SetAlpha(float alpha) { mColor.w = alpha; }
     float GetAlpha() const { return mColor.w; }
 
+    /// The transfer mode.
     void SetXFermode(XFermode mode) { mXFermode = mode; }
     XFermode GetXFermode() const { return mXFermode; }
 
+    /// Fill, stroke, or both.
     void SetStyle(Style style) { mStyle = style; }
     Style GetStyle() const { return mStyle; }
 
+    /// The width of lines and strokes, in pixels.
     void SetLineWidth(float width) { mLineWidth = width; }
     float GetLineWidth() const { return mLineWidth; }
 
+    /// Soft edges of rectangles, simple lines and bitmaps; other shapes always have them.
     void SetAntiAliasing(bool on) { mAntiAliasing = on; }
     bool IsAntiAliasing() const { return mAntiAliasing; }
 
-    // Lengths of a dash, a gap, a dash, a gap, repeated along the line; two stand for four. A first length
-    // that is not greater than -1 means no dashes.
+    /// Lengths of a dash, a gap, a dash, a gap, repeated along the line; two numbers are used twice. A first
+    /// length that is not greater than -1 means no dashes.
     void SetDashedLinePattern(Vector2<float> const& pattern) {
         mDashedLinePattern = {pattern.x, pattern.y, pattern.x, pattern.y};
     }
@@ -90,9 +97,11 @@ public:
     Vector4<float> GetDashedLinePattern() const { return mDashedLinePattern; }
     void ClearDashedLinePattern() { mDashedLinePattern = kNoDashes; }
 
+    /// The ends of full lines.
     void SetLineCapType(LineCapType type) { mLineCapType = type; }
     LineCapType GetLineCapType() const { return mLineCapType; }
 
+    /// The tile mode of bitmaps, for both axes or for each.
     void SetTileMode(TileMode mode) { SetTileMode(mode, mode); }
     void SetTileMode(TileMode x, TileMode y);
     TileMode GetTileModeX() const { return mTileModeX; }

@@ -1,10 +1,10 @@
-// WorkerTask: tasks that carry a call, with copies of its arguments, or a deletion onto the render thread,
-// and the functions that post them.
-//
-// Arguments are stored by value, in the decayed type of the parameter. A reference parameter is bound to the
-// task's own copy: a result that a function writes through it is lost with the task.
-// A by-value parameter gets a fresh copy. The task owns neither the object nor the targets of stored
-// pointers.
+/// WorkerTask: tasks that carry a call, with copies of its arguments, or a deletion onto the render thread,
+/// and the functions that post them.
+///
+/// Arguments are stored by value, in the decayed type of the parameter. A reference parameter is bound to the
+/// task's own copy: a result that a function writes through it is lost with the task.
+/// A by-value parameter gets a fresh copy. The task owns neither the object nor the targets of stored
+/// pointers.
 // Compat: reference-arguments
 #pragma once
 
@@ -17,15 +17,17 @@
 
 namespace Moka::WorkerTask {
 
-// Calls a member function, virtual ones on the object's dynamic type. F is the type of the member pointer; a
-// result it returns is discarded.
+/// Calls a member function, virtual ones on the object's dynamic type. F is the type of the member pointer; a
+/// result it returns is discarded.
 template <class T, class F, class... Arguments>
 class Member final : public ITask {
 public:
+    /// Copies function and values.
     template <class... Values>
     Member(T* object, F function, Values&&... values)
         : mObject(object), mFunction(function), mArguments(std::forward<Values>(values)...) {}
 
+    /// Calls the function.
     void run() override { Call(std::index_sequence_for<Arguments...>()); }
 
 private:
@@ -40,6 +42,7 @@ private:
     std::tuple<Arguments...> mArguments;
 };
 
+/// Member with this many arguments.
 template <class T, class F>
 using Member0 = Member<T, F>;
 template <class T, class F, class A1>
@@ -53,22 +56,26 @@ using Member4 = Member<T, F, A1, A2, A3, A4>;
 template <class T, class F, class A1, class A2, class A3, class A4, class A5>
 using Member5 = Member<T, F, A1, A2, A3, A4, A5>;
 
-// Deletes an object when run; a task that is never run leaves it alive.
+/// Deletes an object when run; a task that is never run leaves it alive.
 template <class T>
 class Delete final : public ITask {
 public:
+    /// Takes pointer over.
     explicit Delete(T* pointer) : mPointer(pointer) {}
+    /// Deletes the object.
     void run() override { delete mPointer; }
 
 private:
     T* mPointer;
 };
 
-// Frees an array when run.
+/// Frees an array when run.
 template <class T>
 class DeleteArray final : public ITask {
 public:
+    /// Takes pointer over.
     explicit DeleteArray(T* pointer) : mPointer(pointer) {}
+    /// Frees the array.
     void run() override { delete[] mPointer; }
 
 private:
@@ -80,7 +87,7 @@ namespace detail {
 template <class T, class F, class... Parameters>
 using MemberFor = Member<T, F, std::decay_t<Parameters>...>;
 
-// The member task for a function: its parameter types, decayed, are what is stored.
+/// The member task for a function: its parameter types, decayed, are what is stored.
 template <class T, class F>
 struct TaskFor;
 template <class T, class R, class C, class... P>
@@ -102,29 +109,31 @@ struct TaskFor<T, R (C::*)(P...) const noexcept> {
 
 } // namespace detail
 
-// Hands a task over and destroys it at once when the queue refuses it. A null task (memory ran out) is still
-// offered, so that the queue sees the attempt, and counts as refused.
+/// Hands a task over and destroys it at once when the queue refuses it. A null task (memory ran out) is still
+/// offered, so that the queue sees the attempt, and counts as refused.
 inline bool PostOrDestroy(IGLMsgQueue* queue, ITask* task) {
     if (queue->Post(task)) return task != nullptr;
     delete task;
     return false;
 }
 
-// Posts object->function(values...). If the queue refuses, a reference that the caller took for the task is
-// kept, so the object is never deleted. // Compat: refused-post
+/// Posts object->function(values...). If the queue refuses, a reference that the caller took for the task is
+/// kept, so the object is never deleted.
+// Compat: refused-post
 template <class T, class F, class... Values>
 bool PostMember(IGLMsgQueue* queue, T* object, F function, Values&&... values) {
     using Task = typename detail::TaskFor<T, F>::Type;
     return PostOrDestroy(queue, new (std::nothrow) Task(object, function, std::forward<Values>(values)...));
 }
 
-// Posts the deletion of a render-side object; refused, the object leaks rather than dying on the wrong
-// thread.
+/// Posts the deletion of a render-side object; refused, the object leaks rather than dying on the wrong
+/// thread.
 template <class T>
 bool PostDelete(IGLMsgQueue* queue, T* pointer) {
     return PostOrDestroy(queue, new (std::nothrow) Delete<T>(pointer));
 }
 
+/// Posts the deletion of an array.
 template <class T>
 bool PostDeleteArray(IGLMsgQueue* queue, T* pointer) {
     return PostOrDestroy(queue, new (std::nothrow) DeleteArray<T>(pointer));

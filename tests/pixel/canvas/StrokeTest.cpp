@@ -257,7 +257,7 @@ TEST_F(StrokeTest, StrokesOfManyColorsMergeIntoAFewCalls) {
     ExpectSame(single, merged, "strokes merged", &slack);
 }
 
-TEST_F(StrokeTest, StripsAndClipsCutWithoutATrace) {
+TEST_F(StrokeTest, StripsAndScissorsCutWithoutATrace) {
     auto const whole = [](IMKCanvas& canvas, Scenes::SceneStage& stage) {
         MKPaint paint;
         paint.SetColor(0.2f, 0.4f, 0.9f, 0.5f);
@@ -277,20 +277,15 @@ TEST_F(StrokeTest, StripsAndClipsCutWithoutATrace) {
     Picture const start = MakeBackdrop(kWidth, kHeight);
     Picture const plain = Draw({start, whole});
     Picture const cut = Draw({start, scissored});
-    Picture const turned = Draw({start, stenciled});
-    int drawn = 0;
     for (int y = 0; y < kHeight; ++y) {
         for (int x = 0; x < kWidth; ++x) {
             bool const inside = x >= 20 && x < 90 && y >= 15 && y < 75;
             ASSERT_EQ(cut.GetColor(x, y), (inside ? plain : start).GetColor(x, y)) << x << ", " << y;
-            bool const isOne = turned.GetColor(x, y) == plain.GetColor(x, y) ||
-                               turned.GetColor(x, y) == start.GetColor(x, y);
-            ASSERT_TRUE(isOne) << x << ", " << y;
-            drawn += turned.GetColor(x, y) == start.GetColor(x, y) ? 0 : 1;
         }
     }
-    EXPECT_GT(drawn, 1000);
-    // Wider than high, so that the width allows three strips.
+    // Custom drawables are not cut by clips that need the stencil; they come out whole.
+    ExpectSame(plain, Draw({start, stenciled}), "stroke under a rotated clip");
+    // Three strips.
     Drawing const tall{MakeBackdrop(40, 110), [](IMKCanvas& canvas, Scenes::SceneStage& stage) {
                            MKPaint paint;
                            paint.SetColor(0.2f, 0.4f, 0.9f, 0.5f);

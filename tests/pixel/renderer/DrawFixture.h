@@ -103,7 +103,7 @@ protected:
     }
     void SetStencil(StencilComparison comparison, int reference, StencilOperation pass) const {
         DepthStencilStateDescriptor descriptor(false, true);
-        descriptor.SetStencilFunction(comparison, reference, 0xFF, 0xFF);
+        descriptor.SetStencilFunction(comparison, reference, 0xFF, pass == StencilKeep ? 0u : 0xFFu);
         descriptor.SetStencilOperation(StencilKeep, StencilKeep, pass);
         stencil->SetDescriptor(descriptor);
         stencil->Apply();

@@ -331,8 +331,11 @@ private:
     // In eighths of the target.
     void FillBox(Brush const& brush, Box const& box, Color const& color, bool writesColor) {
         ApplyStates(true, writesColor);
-        Fill(brush, color, static_cast<float>(box.x), static_cast<float>(box.y),
-             static_cast<float>(box.x + box.w), static_cast<float>(box.y + box.h));
+        // A quarter of a pixel covers the same centres.
+        float const shift = mActive == 2 ? 0.0f : static_cast<float>(Below(3) - 1) / 4;
+        auto const x = static_cast<float>(box.x) + shift;
+        auto const y = static_cast<float>(box.y) + shift;
+        Fill(brush, color, x, y, x + static_cast<float>(box.w), y + static_cast<float>(box.h));
         Draw(box, writesColor, [&](int, int) { return color; });
     }
     // Texel on pixel.

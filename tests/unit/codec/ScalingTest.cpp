@@ -10,8 +10,6 @@
 namespace Moka::Testing {
 namespace {
 
-using detail::PixelSize;
-
 // The weight of source pixel i in target pixel j along one axis, straight from the definitions.
 double ReferenceWeight(int from, int to, int i, int j) {
     double const scale = static_cast<double>(from) / to;

@@ -32,7 +32,7 @@ TEST_F(TaskQueueTest, RunsEachProducersTasksInOrderAndWaitingSeesThem) {
         producers.emplace_back([&queue] {
             std::vector<int> seen; // the wait is what makes it ours again
             std::vector<int> expected;
-            for (int i = 0; i < 2000; ++i) {
+            for (int i = 0; i < 600; ++i) {
                 EXPECT_TRUE(queue.Post(MakeTask([&seen, i] { seen.push_back(i); })));
                 expected.push_back(i);
                 // Now and then the consumer gets to sleep, so that posts meet it falling asleep.

@@ -32,7 +32,6 @@ namespace {
 using nlohmann::json;
 using testing::AllOf;
 using testing::Contains;
-using testing::ElementsAre;
 using testing::HasSubstr;
 
 // Of this process, so that tests run side by side.

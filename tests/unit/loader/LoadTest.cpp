@@ -3,6 +3,8 @@
 
 #include "tests/support/Queues.h"
 
+#include <future>
+
 namespace Moka::Testing {
 namespace {
 
@@ -95,6 +97,7 @@ TEST_F(Load, NoUploadIsPostedAfterCancelHasReturned) {
     String const path = WritePicture("tall.mki", 1, 500 * kMaxSide);
     CountingQueue counting(*queue);
     std::thread canceller;
+    std::promise<void> cancelled;
     int whenCancelled = 0;
     int whenUploaded = 0;
     listener.whenNoted = [&](std::string const& event) {
@@ -102,8 +105,10 @@ TEST_F(Load, NoUploadIsPostedAfterCancelHasReturned) {
         canceller = std::thread([&] {
             Loader().CancelAllLoadRequest(&listener);
             whenCancelled = counting.posted;
+            cancelled.set_value();
         });
-        std::this_thread::sleep_for(std::chrono::milliseconds(20)); // it waits for the loader by now
+        // Time for one that does not wait for the loader.
+        cancelled.get_future().wait_for(std::chrono::milliseconds(300));
     };
     listener.whenLoaded = [&](Bitmap*, IMKBitmap*) { whenUploaded = counting.posted; };
     Loader().RequestLoad(&listener, 1, path, BITMAP_TYPE_GRAPHICS, &counting, 0, 0);

@@ -7,7 +7,6 @@ namespace {
 
 using detail::FindGlslDeclarations;
 using ::testing::ElementsAre;
-using ::testing::IsEmpty;
 
 std::vector<std::string> Find(char const* source, std::vector<std::string> const& qualifiers) {
     std::vector<std::string> found;

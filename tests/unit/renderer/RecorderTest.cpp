@@ -102,23 +102,6 @@ TEST_F(RecorderTest, VerticesOfTwoObjectsStayEachItsOwnWhicheverGetsNewOnes) {
     other->Release();
 }
 
-// A flush on the way there takes vertices out of the list.
-TEST_F(RecorderTest, TheFirstDrawingOfATextureOntoItselfInImmediateModeHasItsVertices) {
-    RendererFactory::SetDeferred(false);
-    IShaderProgram* const sampling =
-        RendererFactory::CreateShaderProgram("", "uniform sampler2D uTexture;", "Sampling");
-    IParameterBinding* const unit = sampling->GetParameter("uTexture");
-    int const zero = 0;
-    unit->Set(&zero);
-    sampling->MakeCurrent();
-    texture->Bind(0);
-    SetVertices({0, 1, 2, 3});
-    EXPECT_TRUE(graphics->Draw(0, -1, 1));
-    EXPECT_TRUE(RendererTrace::GetViolations().empty());
-    delete unit;
-    sampling->Release();
-}
-
 TEST_F(RecorderTest, AProgramBuiltAgainInANewContextKeepsItsValuesAndHandles) {
     float value = 2.5f;
     width->Set(&value);
