@@ -153,7 +153,7 @@ TEST_P(AllocationFaults, AnObjectThatCannotBeMadeLeavesNothingBehind) {
     SweepAllocations(Faults::Kind::Objects, [&](bool) {
         EXPECT_EQ(RendererTrace::CountLiveObjects(), alive);
         EXPECT_EQ(Faults::CountLive(Faults::Kind::Objects), objects);
-        // A class that memory ran out for has no shader from then on, by design: its drawables draw nothing
+        // A class that memory ran out for has no shader from then on: its drawables draw nothing
         // until the process ends. For the sweep it ends here, where no shader is in use.
         ForgetShaders();
     });

@@ -30,7 +30,7 @@ Sweep theSweeps[3];
 Sweep& SweepOf(Faults::Kind kind) { return theSweeps[static_cast<int>(kind)]; }
 
 // Ahead of each block of operator new. Those that are counted are in a list, so that a leak checker finds
-// what leaks by design. Keeps the alignment.
+// the leaks that docs/ownership.md lists. Keeps the alignment.
 struct alignas(std::max_align_t) Header {
     bool isCounted;
     Header* previous;

@@ -49,7 +49,7 @@ TEST_F(SubBitmap, EveryPostedOperationHoldsOneReferenceUntilItRan) {
     EXPECT_EQ(get(TextureParamWrappingT), TextureWrapRepeat);
 }
 
-// A strip measures against its size, inclusive, and not against its edges; callers rely on it.
+// A strip measures against its size, inclusive, and not against its edges: see docs/compatibility.md, pixel-bounds.
 TEST_F(SubBitmap, ReadsAPixelByItsOwnOddBounds) {
     constexpr Point kOutside(-1, -1); // reads 0
     struct {

@@ -134,7 +134,7 @@ TEST_F(FrontEnd, RefusedRequestsAreDroppedAndOnlyTheReferencesStay) {
     EXPECT_EQ(queue.GetPendingCount(), 0);
     EXPECT_EQ(CountOf(source.Get()), 1 + 3);
     EXPECT_EQ(drawable.references, 2);
-    for (int i = 0; i < 3; ++i) source->Unref(); // what refusals leak, by design
+    for (int i = 0; i < 3; ++i) source->Unref(); // the references of the refused requests
     // A refused clip counts all the same: saved and restored, it comes back as one that hides everything.
     refuse = true;
     canvas->SetClipRect(0, 0, 9, 9, IMKCanvasBase::Intersect);
@@ -188,10 +188,10 @@ TEST_F(FrontEnd, ARefusedDeletionLeavesTheRenderSideAlive) {
     queue.RunAll();
     int held = 0;
     RefusingQueue some(RefusingQueue::Predicate([&](int ordinal, ITask* task) {
-        if (ordinal == 1) return false; // the making of the clip
+        if (ordinal == 1) return false; // creates the clip
         held = CountOf(target.Get());
         OnRenderThread const here;
-        task->run(); // what it would have leaked, by design
+        task->run(); // which gives its references back
         return true;
     }));
     auto onSome = CanvasPtr::Adopt(MKGraphicsFactory::CreateCanvas(&some, target.Get(), 1));
