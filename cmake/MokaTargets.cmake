@@ -7,8 +7,9 @@ target_compile_options(moka_compile_options INTERFACE
   $<$<BOOL:${MOKA_WARNINGS_AS_ERRORS}>:-Werror>)
 target_compile_definitions(moka_compile_options INTERFACE $<$<CONFIG:Debug>:MOKA_CHECKS=1>)
 if(MOKA_SANITIZE)
+  # Line numbers are all that a report needs; the rest of the debugging information takes as long as compiling.
   target_compile_options(moka_compile_options INTERFACE
-    -fsanitize=${MOKA_SANITIZE} -fno-sanitize-recover=all -fno-omit-frame-pointer -O1)
+    -fsanitize=${MOKA_SANITIZE} -fno-sanitize-recover=all -fno-omit-frame-pointer -O1 -g1)
   target_link_options(moka_compile_options INTERFACE -fsanitize=${MOKA_SANITIZE})
 endif()
 
