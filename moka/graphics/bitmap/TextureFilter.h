@@ -1,5 +1,5 @@
-// TextureFilter.h: which filter a bitmap is sampled with.
-// Thread: the render thread, or another one once what was requested of the bitmap is done, as after a read-back.
+/// TextureFilter.h: which filter a bitmap is sampled with.
+/// Thread: the render thread, or another one once what was requested of the bitmap is done, as after a read-back.
 #pragma once
 
 #include "moka/graphics/bitmap/IMKBitmap.h"
@@ -9,8 +9,8 @@
 
 namespace Moka {
 
-// The one for drawing smaller, which SetTextureFilter sets. That of the first strip: all have the same. The default
-// one without a texture.
+/// The filter for drawing smaller, which SetTextureFilter sets: that of the first strip, since all strips have the
+/// same. Without a texture the default one.
 inline TextureParamFilteringValue GetTextureFilter(IMKBitmap& bitmap) {
     IMKTextureBitmap* const strips = bitmap.GetTextureBitmap();
     IMKSubBitmap* const first = strips ? strips->GetSubBitmap(0) : nullptr;
