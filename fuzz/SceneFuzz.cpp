@@ -1,16 +1,20 @@
-// Reads bytes as a scene file and, where it is one of few operations, draws it over the tracing renderer. A
-// text that is no scene is refused with a message of one line that begins with the file and a line of it.
+// Reads bytes as a scene file and, where it is one of few operations, draws it over the tracing renderer and
+// records it: the recording is a scene again. A text that is no scene is refused with a message of one line that
+// begins with the file and a line of it.
 #include "fuzz/CanvasWorld.h"
 #include "moka/base/log/LogSink.h"
 #include "moka/graphics/factory/MKGraphicsFactory.h"
 #include "scenes/SceneError.h"
 #include "scenes/SceneFile.h"
+#include "scenes/SceneRecorder.h"
 #include "scenes/SceneRenderer.h"
 #include "scenes/SceneText.h"
 
 #include <algorithm>
 #include <cctype>
+#include <filesystem>
 #include <string>
+#include <unistd.h>
 
 namespace Moka::Fuzz {
 namespace {
@@ -56,7 +60,19 @@ void Draw(Scene const& scene, FuzzInput& input) {
                                         std::min(scene.height, kMaxSide), nullptr, false, 1, false));
     auto const canvas =
         RefPtr<IMKCanvas>::Adopt(MKGraphicsFactory::CreateCanvas(&world.queue, target.Get(), 1));
-    Scenes::DrawScene(scene, *canvas, stage);
+    static std::filesystem::path const folder =
+        std::filesystem::temp_directory_path() / ("moka-recording-" + std::to_string(getpid()));
+    std::filesystem::create_directory(folder);
+    std::string const path = folder / "scene.json";
+    auto const recorder = Scenes::SceneRecorder::Start(path, *canvas);
+    Require(static_cast<bool>(recorder), "no recorder");
+    Scenes::DrawScene(scene, *recorder, stage);
+    try {
+        if (recorder->Close()) Scenes::LoadScene(path); // else more than a scene may hold
+    } catch (Scenes::SceneError const& error) {
+        Require(false, error.what());
+    }
+    std::filesystem::remove_all(folder);
 }
 
 void RequireMessage(std::string const& text) {
