@@ -36,7 +36,7 @@ public:
     // message, if that failed.
     bool Close();
 
-    // Results of what was written, and the autosave if it is due. Returns the milliseconds to the next one, or -1.
+    // Reports the saves that have ended, and starts an autosave that is due. Returns the milliseconds to the next one, or -1.
     int Tick(std::uint32_t now);
     // Behind all that is being written.
     void Run(std::function<PageStore::Report()> work) { mStore.Run(std::move(work)); }

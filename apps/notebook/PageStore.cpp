@@ -38,7 +38,7 @@ std::string WriteSplice(Splice const& splice, std::string const& folder) {
 
 std::string_view TakeLine(std::string_view& text) {
     std::size_t const end = text.find('\n');
-    if (end == std::string_view::npos) return text = {}; // cut off while it was written
+    if (end == std::string_view::npos) return text = {}; // the writer was killed in this line
     std::string_view const line = text.substr(0, end);
     text.remove_prefix(end + 1);
     return line;
@@ -169,8 +169,8 @@ PageStore::Opened PageStore::Open(std::string const& path) {
     } else {
         std::string const aside = journal + ".kept";
         rename(journal.c_str(), aside.c_str());
-        opened.problems.push_back(path + " has changed since " + journal + " was written, which is kept as " +
-                                  aside);
+        opened.problems.push_back(path + " has changed since the last edit in " + journal +
+                                  ", which is kept as " + aside);
     }
     return opened;
 }

@@ -36,7 +36,7 @@ public:
 
     void Signal(int signal) const;
     bool IsOver() const;
-    // What it has written to stderr so far.
+    // Its output on stderr so far.
     std::string GetError() const;
     ProcessResult Wait();
 

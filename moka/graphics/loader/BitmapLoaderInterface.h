@@ -28,7 +28,7 @@ public:
     virtual void OnLoadList(int id, String const& path, std::vector<Bitmap*>& bitmaps);
     virtual void OnLoadList(int id, String const& path, std::vector<IMKBitmap*>& bitmaps);
 
-    /// The file could not be read; the file was written; it could not be.
+    /// One call for each request: loading failed, saving succeeded, or saving failed.
     virtual void OnLoadError(int id, String const& path) = 0;
     virtual void OnSave(int id, String const& path, void* userData) = 0;
     virtual void OnSaveError(int id, String const& path, void* userData) = 0;

@@ -40,7 +40,7 @@ public:
         std::function<void(int id, String const& path, std::vector<BitmapT*>& bitmaps)> onLoadList;
         /// The file could not be read; the log says why.
         std::function<void(int id, String const& path)> onLoadError;
-        /// The file was written.
+        /// The file is complete on the disk.
         std::function<void(int id, String const& path, void* userData)> onSave;
         /// The file could not be written; the log says why.
         std::function<void(int id, String const& path, void* userData)> onSaveError;

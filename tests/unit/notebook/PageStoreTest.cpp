@@ -61,7 +61,8 @@ TEST_F(NotebookStoreTest, AnAutosaveAppendsTheChangesAndAKillLosesNone) {
     std::uintmax_t const size = std::filesystem::file_size(mJournal);
     page.Append(MakeDash(4, 4));
     Autosave(*document);
-    EXPECT_LT(std::filesystem::file_size(mJournal) - size, 200u) << "more than one stroke was written";
+    EXPECT_LT(std::filesystem::file_size(mJournal) - size, 200u)
+        << "the journal grew by more than one stroke";
     EXPECT_TRUE(AreSame(OpenCopy(), page.GetObjects()));
     document->Save(nullptr);
     EXPECT_TRUE(document->Close());
