@@ -19,7 +19,7 @@ ProgramState::ProgramState(std::shared_ptr<Recorder> const& recorder, char const
 bool ProgramState::BuildIn(std::shared_ptr<Recorder> const& recorder) {
     if (mIsReleased) return false;
     if (mRecorder == recorder) return mName != 0;
-    // Its former context is gone, and the device's program with it.
+    // The former context and its device program no longer exist.
     Device& device = recorder->GetDevice();
     ProgramLayout layout;
     DeviceName const name =
@@ -42,7 +42,7 @@ bool ProgramState::BuildIn(std::shared_ptr<Recorder> const& recorder) {
     return mName != 0;
 }
 
-// The values set so far, to where the layout has them.
+// Copies the values set so far to their places in the new layout.
 void ProgramState::CopyValues(ProgramLayout const& layout, std::vector<unsigned char>& values) const {
     for (ProgramLayout::Uniform const& old : mLayout.uniforms) {
         ProgramLayout::Uniform const* const now = Find(layout, old.name);
@@ -82,7 +82,7 @@ BindingType ProgramState::GetType(std::size_t handle) const { return mHandles[ha
 
 namespace {
 
-// Whether the value was another one. In line: twice as fast as memcmp.
+// Returns true if the value changed. The inline comparison is twice as fast as memcmp.
 template <class Word, std::size_t kWords = 1>
 bool Replace(unsigned char* kept, void const* value) {
     Word before[kWords];
@@ -109,7 +109,7 @@ bool Replace(unsigned char* kept, void const* value, BindingType type) {
     case BindingTypeTextureUnit:
         return Replace<std::uint32_t>(kept, value);
     case BindingTypeBool: {
-        // Callers hand over a bool, of which only one byte is there to be read.
+        // Callers pass a pointer to a bool, so only one byte is readable.
         std::int32_t const flag = *static_cast<bool const*>(value) ? 1 : 0;
         return Replace<std::uint32_t>(kept, &flag);
     }

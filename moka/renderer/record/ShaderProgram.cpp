@@ -41,8 +41,8 @@ public:
     }
 
 private:
-    // Values of a program that is not the current one wait until it is. Outside of a target the host may have
-    // made a program of its own current.
+    // Values of a program that is not current reach GL when it becomes current. While no target is active,
+    // the host may have made its own program current.
     void CommitValues(Recorder& recorder) {
         bool const isCurrent =
             recorder.IsAttached() && recorder.GetActive() && recorder.requested->GetProgram() == mProgram;
@@ -50,12 +50,12 @@ private:
     }
 
     std::shared_ptr<ProgramState> const mProgram;
-    void const* const mObject; // names the program to the observer, not used otherwise
+    void const* const mObject; // identifies the program to the observer; never dereferenced
     std::size_t const mHandle;
 };
 
-// A parameter of no program. It has no state, so all of them share one place in memory, and handing one out
-// cannot fail.
+// The parameter that is returned if memory runs out. It has no state, so one static object serves all
+// callers.
 class InertParameter final : public IParameterBinding {
 public:
     static IParameterBinding* Get() {
@@ -97,7 +97,7 @@ void ShaderProgram::MakeCurrent() {
         try {
             mState->BuildIn(recorder->shared_from_this());
         } catch (std::bad_alloc const&) {
-            // It draws nothing.
+            // Draws with this program then do nothing.
         }
     }
     recorder->requested->SetProgram(mState);
