@@ -8,7 +8,8 @@
 namespace Moka::detail {
 namespace {
 
-// How far a point that is left out may be off, and how much its radius, in device pixels.
+// The largest deviation of a dropped point from the segment that replaces it, in position and radius, in
+// device pixels.
 constexpr double kStrokeTolerance = 1.0 / 24;
 
 } // namespace

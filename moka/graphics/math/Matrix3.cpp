@@ -27,7 +27,7 @@ Matrix3<T> Product(Matrix3<T> const& left, Matrix3<T> const& right) {
     return result;
 }
 
-// The adjugate, in single precision.
+// Computes the adjugate in single precision.
 template <class T>
 void Adjugate(T const* m, T (&a)[9]) {
     a[0] = m[4] * m[8] - m[7] * m[5];
@@ -48,16 +48,16 @@ RectF MapCorners(T const* m, T left, T top, T right, T bottom) {
     T mappedX[4];
     T mappedY[4];
     T w[4];
-    // Four at once.
+    // Loops over four points, which compilers vectorise.
     for (int i = 0; i < 4; ++i) w[i] = m[2] * xs[i] + m[5] * ys[i] + m[8];
     for (int i = 0; i < 4; ++i) mappedX[i] = m[0] * xs[i] + m[3] * ys[i] + m[6];
     for (int i = 0; i < 4; ++i) mappedY[i] = m[1] * xs[i] + m[4] * ys[i] + m[7];
-    // Dividing by 1 changes nothing, and takes time.
+    // Skips divisions by 1, which cost time and change nothing.
     if (w[0] != 1 || w[1] != 1 || w[2] != 1 || w[3] != 1) {
         for (int i = 0; i < 4; ++i) mappedX[i] /= w[i];
         for (int i = 0; i < 4; ++i) mappedY[i] /= w[i];
     }
-    // Only a first corner that is not a number leaves its trace.
+    // The comparisons skip NaN, except in the first corner.
     RectF box(mappedX[0], mappedY[0], mappedX[0], mappedY[0]);
     for (int i = 1; i < 4; ++i) {
         box.left = mappedX[i] < box.left ? mappedX[i] : box.left;

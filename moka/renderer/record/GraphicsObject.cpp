@@ -57,7 +57,7 @@ bool GraphicsObject::Draw(int first, int count, int instances) {
     RequestScope const scope(*mRecorder);
     if (!scope) return false;
     if (instances != 1) {
-        __android_log_print(ANDROID_LOG_ERROR, "mok_log", "a draw of %d instances is refused; 1 is drawn",
+        __android_log_print(ANDROID_LOG_ERROR, "mok_log", "a draw of %d instances is refused; pass 1",
                             instances);
         return false;
     }
