@@ -1,5 +1,5 @@
-// BareShapes.h: what the benchmarks have the library draw, drawn by bare GL: the vertices are computed from
-// the same shapes and uploaded in each frame, because a frame's shapes are new.
+// BareShapes.h: draws the shapes of the benchmarks with bare GL. The vertices are computed from the same
+// shapes and uploaded in each frame, as for new shapes.
 // Thread: render thread, from construction to destruction.
 #pragma once
 
@@ -13,9 +13,9 @@ namespace Moka::Bench {
 class BareRects {
 public:
     BareRects();
-    // One draw call each, with the colour as the uniform that changes.
+    // Draws each rectangle with one draw call. The colour is a uniform.
     void DrawEach(int count, int size);
-    // All in one call, with a colour in each vertex.
+    // Draws all rectangles with one call. Each vertex has a colour.
     void DrawTogether(int count, int size);
 
 private:
@@ -41,7 +41,8 @@ private:
     std::vector<float> mFloats;
 };
 
-// Shapes of one kind and of distinct colours in one call. Each vertex has all that its shape's program needs.
+// Draws shapes of one kind and of different colours with one call. Each vertex has all values that the
+// program needs.
 class BareBatch {
 public:
     enum class Shape { Rect, Circle, Line };
@@ -70,7 +71,7 @@ private:
     std::vector<float> mFloats;
 };
 
-// Across and then down, nine samples each.
+// Blurs horizontally, then vertically, with nine samples each.
 class BareBlur {
 public:
     BareBlur();

@@ -25,7 +25,7 @@ namespace {
 
 constexpr std::size_t kThreadNameBytes = 16;
 
-// Without a category: the name of a thread.
+// An event. If category is null, it sets the name of a thread.
 struct Event {
     char const* category;
     char const* name;
@@ -38,9 +38,9 @@ struct Event {
 };
 
 constexpr std::size_t kBufferedEvents = 4096;
-constexpr std::int64_t kOldest = 500'000'000; // nanoseconds until buffered events are written
+constexpr std::int64_t kOldest = 500'000'000; // nanoseconds after which buffered events are written
 
-// What is between quotes. Names of threads may be anything.
+// Appends a JSON string. Thread names may contain any bytes.
 void AppendText(std::string& out, char const* text) {
     out += '"';
     for (; *text; ++text) {
@@ -98,7 +98,8 @@ void AppendName(std::string& out, char const* what, int thread, char const* name
     out += "}}";
 }
 
-// The file. Whole blocks or nothing: a write that fails is cut off again, so that what is there can be read.
+// The trace file. If a write fails, the file is truncated to the last complete block, so that it stays
+// readable.
 class TraceFile {
 public:
     bool Open(std::string const& path) {
@@ -112,7 +113,7 @@ public:
     std::string const& GetPath() const { return mPath; }
     std::string const& GetFailure() const { return mFailure; }
 
-    // False once; what comes later is dropped without a word.
+    // Returns false at the first failure. Later blocks are dropped silently.
     bool Write(std::string const& block) {
         if (!mFailure.empty()) return true;
         std::size_t done = 0;
@@ -128,7 +129,7 @@ public:
     }
 
     void Close() {
-        // Not through Write: after a failure there may be room for the end all the same.
+        // Does not use Write: after a failure there may still be room for these few bytes.
         char const end[] = "\n]\n";
         if (write(mFile, end, sizeof end - 1) != sizeof end - 1 && mFailure.empty())
             mFailure = std::strerror(errno);
@@ -157,7 +158,7 @@ int GetThreadNumber() {
 class Writer {
 public:
     static Writer& Get(std::atomic<bool>& isOn) {
-        // Never destroyed: threads may trace until the process is gone.
+        // Never destroyed, because threads may trace until the process has ended.
         static Writer& writer = *new Writer(isOn);
         return writer;
     }
@@ -175,8 +176,8 @@ private:
 
     std::atomic<bool>& mIsOn;
 
-    // The file and what is on its way there. Taken before the buffer's lock is given back, so that Stop finds no
-    // events between the two.
+    // Guards the file and the events that are being written. It is locked before the buffer's lock is
+    // released, so that Stop does not miss events between the two.
     std::mutex mFileLock;
     TraceFile mFile;
     std::vector<Event> mWriting;
@@ -186,7 +187,7 @@ private:
     std::vector<Event> mEvents;
     std::int64_t mStart = 0;
     std::int64_t mLastWritten = 0;
-    // Of the trace; a thread that has not seen it yet tells its name.
+    // The number of the trace. A thread that sees a new number adds an event with its name.
     unsigned mNumber = 0;
 };
 
@@ -257,11 +258,12 @@ void Writer::Add(Event const& event) noexcept {
         mEvents.push_back(name);
     }
     mEvents.push_back(event);
-    bool const isFull = mEvents.size() + 2 > kBufferedEvents; // the next event may bring a name
+    bool const isFull =
+        mEvents.size() + 2 > kBufferedEvents; // the next event may need another one for the name
     if (isFull || event.end - mLastWritten > kOldest) WriteOut(buffer);
 }
 
-// Gives the buffer's lock back as soon as the file's is held. The log's sink is called without either.
+// Releases the buffer's lock as soon as it holds the file's lock. Logs without either lock.
 void Writer::WriteOut(std::unique_lock<std::mutex>& buffer) noexcept {
     std::unique_lock<std::mutex> file(mFileLock);
     mWriting.clear();

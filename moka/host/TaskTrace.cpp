@@ -29,7 +29,7 @@ std::string Describe(std::type_info const& type) {
     return text;
 }
 
-// Stays valid for good, as a trace needs it.
+// Returns a name that stays valid until the process ends, as a trace requires.
 char const* GetTypeName(std::type_info const& type) {
     static std::mutex lock;
     static auto& names = *new std::map<std::type_index, std::string>;

@@ -20,7 +20,7 @@ Function* Find(void* library, char const* name) {
     return library ? reinterpret_cast<Function*>(dlsym(library, name)) : nullptr;
 }
 
-// The functions of libxcb that are used here. Null members: there is no libxcb.
+// The functions of libxcb that are used here. They are null if libxcb is not installed.
 struct Xcb {
     Xcb() : library(dlopen("libxcb.so.1", RTLD_NOW | RTLD_LOCAL)) {}
 
@@ -47,8 +47,8 @@ Xcb const& GetXcb() {
     return xcb;
 }
 
-// An identifier of X has 29 bits; the windows of other systems are pointers, and a wl_display begins with a
-// pointer to its interface's description.
+// X identifiers have 29 bits; windows of other window systems are pointers. A wl_display begins with a
+// pointer to the description of its interface.
 bool IsXWindow(void* display, std::uintptr_t window) {
     if (window >= std::uintptr_t{1} << 29) return false;
     void const* const wayland = dlsym(RTLD_DEFAULT, "wl_display_interface");
@@ -56,12 +56,12 @@ bool IsXWindow(void* display, std::uintptr_t window) {
 }
 
 struct Server {
-    std::string name; // empty: DISPLAY names it
+    std::string name; // if it is empty, DISPLAY names the server
     bool isKnown = true;
 };
 
-// The window may have been created a moment ago, on the application's connection: the server must have it before
-// another connection asks for it.
+// Flushes the application's connection, because the window may have been created a moment ago, and the server
+// must know it before another connection uses it.
 Server Synchronize(void* display) {
     if (!display) return {};
     void* const xlib = dlopen("libX11.so.6", RTLD_NOW | RTLD_NOLOAD);

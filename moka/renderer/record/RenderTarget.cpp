@@ -51,7 +51,7 @@ void RenderTarget::ReadPixels(int x, int y, int width, int height, PixelDestinat
     if (rowLength < width || destination.skipRows < 0 || destination.skipPixels < 0) {
         __android_log_print(ANDROID_LOG_ERROR, "mok_log",
                             "reading %d pixels a row into rows of %d, %d rows down and %d pixels in, is "
-                            "refused; rows must not overlap and nothing can be skipped backwards",
+                            "refused; rows must not overlap and skips must not be negative",
                             width, rowLength, destination.skipRows, destination.skipPixels);
         return;
     }
