@@ -132,7 +132,7 @@ public:
             if (!Step(out, reason)) return false;
         }
         bool const isAllUsed = mInput.pos == mInput.size && mSource.NextBlock().size == 0;
-        return isAllUsed || Refuse(reason, "the payload has bytes after its end");
+        return isAllUsed || Refuse(reason, "the payload has bytes behind its end");
     }
 
 private:
@@ -145,7 +145,7 @@ private:
         if (!mSource.Prefix(kHeaderBytes + kFrameHeaderBytes, head, reason)) return false;
         ByteSpan const frame{head.data + kHeaderBytes, head.size - kHeaderBytes};
         std::uint64_t const content = ZSTD_getFrameContentSize(frame.data, frame.size);
-        if (content == ZSTD_CONTENTSIZE_ERROR) return Refuse(reason, "the payload is not a Zstandard frame");
+        if (content == ZSTD_CONTENTSIZE_ERROR) return Refuse(reason, "the payload is no Zstandard frame");
         if (content != header.GetPixelBytes()) {
             return Refuse(reason, "the payload's content does not fit the size");
         }
