@@ -26,6 +26,7 @@ struct ListVertices {
     std::size_t offset = 0; // floats
     std::size_t size = 0;   // floats
     std::size_t stride = 0; // floats of one vertex
+    int first = 0;          // offset in vertices
 };
 
 // A draw of `count` vertices, starting with vertex `first`.
@@ -53,9 +54,9 @@ public:
     // With merging off, draws share a run only if state and values are equal.
     void SetMerging(bool on) { mMerges = on; }
 
-    // Copies the vertices to a multiple of their stride (in floats). `previous` are the vertices that they
-    // replace: those are removed if no draw uses them and they are the last ones in the list.
-    ListVertices AddVertices(float const* vertices, int count, int stride, ListVertices const& previous);
+    // Copies the vertices to a multiple of their stride (in floats) and sets `place`. The vertices that
+    // `place` named before are removed if no draw uses them and they are the last ones in the list.
+    void AddVertices(float const* vertices, int count, int stride, ListVertices& place);
     bool Has(ListVertices const& vertices) const { return vertices.list == mNumber; }
     float const* GetVertices(ListVertices const& vertices) const {
         return mList.vertices.data() + vertices.offset;
@@ -76,9 +77,7 @@ public:
     }
 
     // Removes the vertices if no draw uses them and they are the last ones in the list.
-    void DropVertices(ListVertices const& vertices) {
-        if (IsUndrawnEnd(vertices)) mList.vertices.resize(vertices.offset);
-    }
+    void DropVertices(ListVertices const& vertices);
 
     // The number of the current list. The first list is 1.
     std::uint64_t GetNumber() const { return mNumber; }
@@ -143,9 +142,11 @@ private:
     };
 
     bool IsUndrawnEnd(ListVertices const& vertices) const;
-    std::size_t AddState(RunState const& state, bool isKnownSame);
+    void Align(std::size_t stride);
+    std::size_t AddState(RunState const& state);
     std::size_t AddValues(ProgramState& program);
     OpenRun* FindRun(std::size_t state, DrawBounds const& bounds);
+    OpenRun* FindEarlierRun(std::size_t state, DrawBounds const& bounds);
     bool MayTouch(OpenRun& run, DrawBounds const& bounds);
     // Returns false if the record needs a run of its own.
     bool Continues(OpenRun const& run, ProgramLayout const& layout, Record const& record,
@@ -180,6 +181,8 @@ private:
     RunEnd mFlushReason = RunEnd::Other; // why the previous list ended
     std::size_t mLastState = kNoState;   // the state of the last draw; separate draws do not count
     std::size_t mDrawnFloats = 0;        // draws use only vertices before this offset
+    std::size_t mEndStride = 0;          // the list's size in floats is mEndVertex times this
+    int mEndVertex = 0;
     // The vertices of all draws. One that is drawn twice counts twice, because gathering may copy it.
     std::size_t mListedFloats = 0;
     // ListVertices and ProgramState::Listed refer to lists by this number, so clearing invalidates them all.
