@@ -69,9 +69,9 @@ protected:
     void DrawAll(std::string const& folder, std::vector<std::string> const& environment) {
         ProcessOptions driver;
         driver.environment = environment;
-        ProcessResult const drawn = Run({"gallery", "--mki", "--out", folder}, driver);
+        ProcessResult const drawn = Run("gallery --mki --out " + folder, driver);
         ASSERT_EQ(drawn.status, 0) << drawn.err;
-        std::string const device = Run({"info", "--device"}, driver).out;
+        std::string const device = Run("info --device", driver).out;
         mReport += device.substr(0, device.find('\n')) + "\n";
     }
 
