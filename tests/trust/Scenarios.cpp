@@ -38,9 +38,7 @@ BitmapPtr MakeBitmap(Stage const& stage) {
 void CreateAndRead(Stage const& stage) {
     BitmapPtr const bitmap = MakeBitmap(stage);
     if (!bitmap) return;
-    for (IMKBitmap* const each : {bitmap.Get(), stage.shared})
-        for (char const* const tag : {"picture", "the same"})
-            if (each) each->SetTag(tag);
+    bitmap->SetTag("picture");
     bitmap->GetTextureBitmap()->UpdateBitmap(GetImage().pixels.data(), kWidth * 4);
     bitmap->GetPixel(Point(3, 3));
     bitmap->GetPixelAsync(Point(1, 1), nullptr, nullptr);

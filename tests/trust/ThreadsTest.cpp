@@ -18,6 +18,7 @@ namespace {
 constexpr int kScenarios = 60;
 constexpr int kLoads = 60;
 constexpr int kCancellations = 15;
+constexpr int kTags = 3000;
 
 // One front end after the other, destroyed with requests in hand: each request calls once at most, and none calls
 // afterwards.
@@ -70,6 +71,10 @@ TEST(ThreadsTest, CallersTheLoaderAndMessageLoopsShareOneRenderThread) {
             });
         threads.emplace_back([&] { CancelAndDestroy<MKBitmapLoader>(queue, path, 1); });
         threads.emplace_back([&] { CancelAndDestroy<BitmapLoader>(queue, path, 2); });
+        threads.emplace_back([&] {
+            auto const own = NewBitmap(queue, 6, 6);
+            for (int i = 0; i < kTags; ++i) own->SetTag(i % 2 == 0 ? "one tag" : "the other");
+        });
         for (std::thread& thread : threads) thread.join();
         MKBitmapLoader::WaitForAllSaveRequestsToEnd(&queue);
     }
