@@ -5,6 +5,7 @@ import com.velmora.android.sdk.pen.graphics.MokaBitmapFactory;
 import java.awt.image.BufferedImage;
 import java.io.IOException;
 import java.nio.ByteBuffer;
+import java.nio.ByteOrder;
 import java.nio.file.Files;
 import java.nio.file.Path;
 import java.util.Arrays;
@@ -22,6 +23,9 @@ public final class DecodeTest {
             Host.expect(Host.decodeThroughJava(alpha.toString(), 0, 0) == null, "decoded too early");
             Host.expect(Host.loadBridge() == 1, "the bridge");
             sameAsNatively(alpha);
+            ByteBuffer size = ByteBuffer.wrap(Host.decodeThroughJava(alpha.toString(), 5, 3));
+            size.order(ByteOrder.nativeOrder());
+            Host.expect(size.getInt(0) == 5 && size.getInt(4) == 3, "the size is not handed over");
             sameAsNatively(savePng("opaque.png", BufferedImage.TYPE_INT_RGB));
             sameAsNatively(savePng("gray.png", BufferedImage.TYPE_BYTE_GRAY));
             sameAsNatively(savePng("palette.png", BufferedImage.TYPE_BYTE_INDEXED));
