@@ -56,11 +56,8 @@ Slack FindAllowed(Scene const& scene) {
     return allowed;
 }
 
-int CountOver(Picture const& a, Picture const& b, int steps) {
-    Slack same(a.width, a.height);
-    for (int y = 0; y < a.height; ++y) {
-        for (int x = 0; x < a.width; ++x) same.Set(x, y, steps);
-    }
+int CountOver(Picture const& a, Picture const& b, unsigned char steps) {
+    Slack const same(a.width, a.height, steps);
     return CompareImages(a, b, &same).differingPixels;
 }
 

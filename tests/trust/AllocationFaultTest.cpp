@@ -122,7 +122,8 @@ protected:
                 check(k <= count);
                 ASSERT_EQ(TakeFrame(), undisturbed);
             }
-        RecordProperty("faults", 2 * (count + 1));
+        mFaults += 2 * (count + 1);
+        RecordProperty("faults", mFaults);
         EXPECT_GT(count, 0);
     }
     template <class Check>
@@ -138,33 +139,28 @@ protected:
 
     SurvivingQueue queue;
     TempFolder const folder;
+
+private:
+    int mFaults = 0;
 };
 
 class AllocationFaults : public FaultSweep {};
 
-TEST_P(AllocationFaults, AnObjectThatCannotBeMadeLeavesNothingBehind) {
-    int const alive = RendererTrace::CountLiveObjects();
-    auto const objects = Faults::CountLive(Faults::Kind::Objects);
-    SweepAllocations(Faults::Kind::Objects, [&](bool) {
-        EXPECT_EQ(RendererTrace::CountLiveObjects(), alive);
-        EXPECT_EQ(Faults::CountLive(Faults::Kind::Objects), objects);
-        // A class that memory ran out for has no shader from then on: its drawables draw nothing
-        // until the process ends. For the sweep it ends here, where no shader is in use.
-        ForgetShaders();
-    });
-}
-
-// The copies of what the caller gave, and the loader's books: a call that lacks memory for them did not happen, or
-// throws.
-TEST_P(AllocationFaults, ACallWithoutMemoryForItsCopiesLeavesNothingBehind) {
+// Objects; and the copies of what the caller gave, and the loader's books: a call that lacks memory for them did not
+// happen, or throws.
+TEST_P(AllocationFaults, ACallWithoutMemoryLeavesNothingBehind) {
     int const alive = RendererTrace::CountLiveObjects();
     auto const objects = Faults::CountLive(Faults::Kind::Objects);
     auto const tasks = Faults::CountLive(Faults::Kind::Tasks);
-    SweepAllocations(Faults::Kind::Throwing, [&](bool) {
-        EXPECT_EQ(RendererTrace::CountLiveObjects(), alive);
-        EXPECT_EQ(Faults::CountLive(Faults::Kind::Objects), objects);
-        EXPECT_EQ(Faults::CountLive(Faults::Kind::Tasks), tasks);
-    });
+    for (Faults::Kind const kind : {Faults::Kind::Objects, Faults::Kind::Throwing})
+        SweepAllocations(kind, [&](bool) {
+            EXPECT_EQ(RendererTrace::CountLiveObjects(), alive);
+            EXPECT_EQ(Faults::CountLive(Faults::Kind::Objects), objects);
+            EXPECT_EQ(Faults::CountLive(Faults::Kind::Tasks), tasks);
+            // A class that memory ran out for has no shader from then on: its drawables draw nothing
+            // until the process ends. For the sweep it ends here, where no shader is in use.
+            ForgetShaders();
+        });
 }
 
 // Of renderer objects: all but programs, which FailCreation does not count.
