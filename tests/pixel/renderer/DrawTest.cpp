@@ -9,32 +9,6 @@ namespace {
 
 using DrawTest = DrawFixture;
 
-TEST_P(DrawTest, AStencilClipHoldsForDrawsAndClearsUntilItIsLifted) {
-    DepthStencilPtr const buffer = MakeDepthStencil(kSize, kSize);
-    target->AttachDepthStencil(buffer.get());
-    target->Activate();
-    target->ClearDepthStencil(false, 1, true, 0);
-    SetStencil(StencilAlways, 1, StencilIncrementSaturate);
-    blend->SetDescriptor(BlendStateDescriptor(false));
-    blend->Apply();
-    Fill(kRed, 2, 2, 6, 6);
-    SetStencil(StencilEqual, 1, StencilKeep);
-    RendererFactory::SetStencilClip(true);
-    blend->SetDescriptor(BlendStateDescriptor(true));
-    blend->Apply();
-    StatePtr const plain(RendererFactory::CreateDepthStencilState(DepthStencilStateDescriptor(false, false)));
-    plain->Apply(); // as every drawable does
-    target->ClearColor(0, 1, 0, 1);
-    Fill(kRed, 0, 0, 4, 8);
-    RendererFactory::SetStencilClip(false);
-    plain->Apply();
-    Fill(kBlue, 7, 7, 8, 8);
-    target->DetachDepthStencil();
-    target->Deactivate(false, false);
-    EXPECT_EQ(Read(),
-              With(With(With(Filled(kClear), kGreen, 2, 2, 4, 4), kRed, 2, 2, 2, 4), kBlue, 7, 7, 1, 1));
-}
-
 void GL_APIENTRY KeepGroup(GLenum, GLenum type, GLuint, GLenum, GLsizei, GLchar const* text,
                            void const* user) {
     auto* const groups = static_cast<std::vector<std::string>*>(const_cast<void*>(user));

@@ -11,6 +11,7 @@ struct Texts {
     char const* subject;
     char const* vertex;
     char const* fragment;
+    bool isMerged = true; // otherwise each draw is a call
 };
 
 inline constexpr Texts kPlain{
@@ -22,8 +23,7 @@ inline constexpr Texts kWide{
     "void main() { gl_Position = matrix * vec4(corner, number, 1.0); }",
     "precision highp float; uniform vec4 color; void main() { gl_FragColor = color; }"};
 
-// Programs that a run may be drawn with.
-inline constexpr Texts kUnderstood[] = {
+inline constexpr Texts kPrograms[] = {
     {"precision statements", MOKA_PLAIN,
      "precision lowp float; precision mediump int; precision highp float;"
      "uniform vec4 color; uniform lowp vec2 pair; uniform mediump float number;"
@@ -81,19 +81,17 @@ inline constexpr Texts kUnderstood[] = {
      "void main() { at[0] = alpha; at[1] = alpha.yx; gl_Position = vec4(zulu, 0.0, 1.0); }",
      "precision mediump float; uniform float number; varying vec2 at[2];"
      "void main() { gl_FragColor = vec4(at[0] * number, at[1].x, 1.0); }"},
-};
-
-// Programs that are drawn one by one.
-inline constexpr Texts kForeign[] = {
     {"gl_VertexID",
      "#version 300 es\nin vec2 corner; void main() { gl_Position = vec4(corner, float(gl_VertexID) * 0.0, "
      "1); }",
-     "#version 300 es\nuniform highp vec4 color; out highp vec4 c; void main() { c = color; }"},
+     "#version 300 es\nuniform highp vec4 color; out highp vec4 c; void main() { c = color; }", false},
     {"a name that GLSL ES 3.00 reserves", MOKA_PLAIN,
      "precision highp float; uniform vec4 color; void main() { vec4 centroid = color; gl_FragColor = "
-     "centroid; }"},
+     "centroid; }",
+     false},
     {"a macro that declares", MOKA_PLAIN,
-     "#define INPUT uniform\nprecision highp float; INPUT vec4 color; void main() { gl_FragColor = color; }"},
+     "#define INPUT uniform\nprecision highp float; INPUT vec4 color; void main() { gl_FragColor = color; }",
+     false},
 };
 
 } // namespace Moka::Testing

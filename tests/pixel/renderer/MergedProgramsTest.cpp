@@ -7,8 +7,6 @@
 #include "tests/support/ImageCompare.h"
 #include "tests/support/LogCapture.h"
 
-#include <limits>
-
 namespace Moka::Testing {
 namespace {
 
@@ -123,34 +121,23 @@ protected:
     ProgramPtr program;
 };
 
-TEST_F(MergedProgramsTest, OnesThatAreUnderstoodDrawTheSameWithOneCall) {
-    for (Texts const& texts : kUnderstood) {
-        Picture const expected = DrawOneByOne(texts, 40);
-        Begin(true);
-        MakeProgram(texts);
-        DrawCells(40);
-        EXPECT_EQ(Flush(), 1) << texts.subject;
-        EXPECT_LE(CompareImages(ReadTarget(), expected).largest, 1) << texts.subject;
-        EXPECT_EQ(RendererFactory::GetStatistics().errors, 0u) << texts.subject;
-    }
-}
-
-TEST_F(MergedProgramsTest, OthersAreDrawnOneByOneAndSayWhyOnce) {
-    for (Texts const& texts : kForeign) {
+TEST_F(MergedProgramsTest, ThoseThatAreUnderstoodDrawWithOneCallAndOthersOneByOneAndSayWhyOnce) {
+    for (Texts const& texts : kPrograms) {
+        SCOPED_TRACE(texts.subject);
         Picture const expected = DrawOneByOne(texts, 40);
         Begin(true);
         LogCapture const log;
         MakeProgram(texts);
         for (int i = 0; i < 2; ++i) {
             DrawCells(40);
-            EXPECT_EQ(Flush(), 40) << texts.subject;
+            EXPECT_EQ(Flush(), texts.isMerged ? 1 : 40);
         }
-        EXPECT_EQ(log.Count(ANDROID_LOG_INFO, "foreign: draws with different values are not merged: "), 1)
-            << texts.subject;
-        EXPECT_EQ(log.Count(ANDROID_LOG_ERROR), 0) << texts.subject;
-        EXPECT_EQ(ReadTarget(), expected) << texts.subject;
-        EXPECT_EQ(RendererFactory::GetStatistics().errors, 0u) << texts.subject;
-        EXPECT_EQ(RendererFactory::GetStatistics().variants, 0) << texts.subject;
+        EXPECT_EQ(log.Count(ANDROID_LOG_INFO, "foreign: draws with different values are not merged: "),
+                  texts.isMerged ? 0 : 1);
+        EXPECT_EQ(log.Count(ANDROID_LOG_ERROR), 0);
+        EXPECT_LE(CompareImages(ReadTarget(), expected).largest, texts.isMerged ? 1 : 0);
+        EXPECT_EQ(RendererFactory::GetStatistics().errors, 0u);
+        EXPECT_EQ(RendererFactory::GetStatistics().variants, texts.isMerged ? 1 : 0);
     }
 }
 
@@ -211,77 +198,6 @@ TEST_F(MergedProgramsTest, AProgramHasSixteenVariantsAtMostAndTakesThemWithIt) {
     program.reset();
     EXPECT_EQ(CountGlPrograms(), before);
     EXPECT_EQ(RendererFactory::GetStatistics().variants, 0);
-}
-
-TEST_F(MergedProgramsTest, ValuesThatAreNoNumbersDoNotReachOtherDraws) {
-    auto const draw = [this](bool merges) {
-        Begin(merges);
-        MakeProgram(kWide);
-        image.target->Activate();
-        program->MakeCurrent();
-        for (int i = 0; i < 60; ++i) {
-            SetValues(i);
-            std::array<float, 4> nowhere{};
-            nowhere.fill(std::numeric_limits<float>::quiet_NaN());
-            if (i % 3 == 1) Set("color", BindingTypeVector4, nowhere);
-            if (i % 3 == 2) Set("number", BindingTypeFloat, nowhere[0]);
-            DrawCell(i);
-        }
-        RendererFactory::Flush();
-        EXPECT_EQ(RendererFactory::GetStatistics().errors, 0u);
-        return ReadTarget();
-    };
-    Picture const expected = draw(false);
-    Picture const merged = draw(true);
-    EXPECT_EQ(RendererFactory::GetStatistics().draws, 1u);
-    for (int i = 0; i < 60; i += 3) {
-        int const x = i % kColumns * kCell + 1;
-        int const y = i / kColumns * kCell + 1;
-        EXPECT_EQ(merged.GetColor(x, y), expected.GetColor(x, y)) << i;
-    }
-}
-
-// Edges that pass through the centres of pixels: the last bit of a position decides over each.
-TEST_F(MergedProgramsTest, PositionsAgreeToTheBit) {
-    constexpr Texts kTurned{
-        "turned",
-        "attribute vec2 corner; uniform mat4 matrix; uniform vec2 pair; uniform highp float number;"
-        "void main() { vec2 p = (corner * pair * 1.5 + number) / number - 1.0;"
-        "gl_Position = matrix * vec4(p, 0.0, 1.0); }",
-        "precision highp float; uniform vec4 color; void main() { gl_FragColor = color; }"};
-    BlendStateDescriptor add(true);
-    add.SetColorEquation(BlendingFunction::Add, BlendingFactor::One, BlendingFactor::One);
-    add.SetAlphaEquation(BlendingFunction::Add, BlendingFactor::One, BlendingFactor::One);
-    auto const draw = [&](bool merges) {
-        Begin(merges);
-        MakeProgram(kTurned);
-        BlendPtr const blend(RendererFactory::CreateBlendStateObject(add));
-        blend->Apply();
-        image.target->Activate();
-        program->MakeCurrent();
-        Set("color", BindingTypeVector4, std::array<float, 4>{2 / 255.0f, 0, 0, 0});
-        for (int i = 0; i < 100; ++i) {
-            // A cell of three pixels that grows by three and turns by an angle whose tangent is a ratio of two odd
-            // numbers.
-            std::array<float, 16> matrix{};
-            matrix[0] = matrix[5] = static_cast<float>(i % 3 * 2 + 1) / 3;
-            matrix[1] = static_cast<float>(i % 5 * 2 + 1) / 3;
-            matrix[4] = -matrix[1];
-            matrix[12] = static_cast<float>(i % 9 - 4) * 2 / kTargetSize;
-            matrix[15] = 1;
-            float const number = 0.7f + static_cast<float>(i) * 0.013f;
-            Set("matrix", BindingTypeMatrix4, matrix);
-            Set("pair", BindingTypeVector2, std::array<float, 2>{2 * number, 2 * number});
-            Set("number", BindingTypeFloat, number);
-            DrawCell(kColumns * kColumns / 2);
-        }
-        RendererFactory::Flush();
-        return ReadTarget();
-    };
-    Picture const expected = draw(false);
-    EXPECT_FALSE(expected == MakeImage(kTargetSize, kTargetSize, kClear));
-    EXPECT_EQ(draw(true), expected);
-    EXPECT_EQ(RendererFactory::GetStatistics().draws, 1u);
 }
 
 } // namespace
