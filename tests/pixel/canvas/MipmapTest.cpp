@@ -241,17 +241,5 @@ TEST_F(MipmapChangeTest, DrawsOfOneMipmappedBitmapAreOneRun) {
     EXPECT_EQ(RendererFactory::GetStatistics().runs - runs, 1u);
 }
 
-TEST_F(MipmapChangeTest, AValueThatIsNoFilterIsRefusedWithOneLineAndTheFilterStays) {
-    onto->ClearAll(static_cast<int>(0xFFFF0000));
-    for (int const value : {3, -1, 0x2601})
-        bitmap->GetBitmapReadable()->SetTextureFilter(TextureParamFilteringMin,
-                                                      static_cast<TextureParamFilteringValue>(value));
-    DrawNext();
-    ExpectColors({kRed});
-    EXPECT_EQ(CountNewUpdates(), 1u);
-    EXPECT_EQ(log.GetTexts(ANDROID_LOG_ERROR).size(), 3u);
-    log.Clear();
-}
-
 } // namespace
 } // namespace Moka::Testing

@@ -164,5 +164,42 @@ TEST_P(RandomTest, JoinedDrawsAreTheSameAsOneByOne) {
 
 INSTANTIATE_TEST_SUITE_P(Seeds, RandomTest, ::testing::Range(1u, 13u));
 
+using FarAwayTest = CanvasDrawing;
+
+// Through a window of 90 x 80 units at (left, top): a mediump float of 16 bits overflows when a distance above 256 is
+// squared, and tells places above 1024 apart to a whole unit only.
+TEST_F(FarAwayTest, EdgesAreAsFineFarFromTheOriginAndFarFromTheirCentre) {
+    MKPaint paint;
+    paint.SetColor(0.9f, 0.5f, 0.2f, 0.8f);
+    paint.SetStyle(MKPaint::Stroke);
+    paint.SetLineWidth(6);
+    paint.SetLineCapType(MKPaint::Round);
+    paint.SetAntiAliasing(true);
+    MKPaint filled = paint, wide = paint, dashed = paint;
+    filled.SetStyle(MKPaint::Fill);
+    wide.SetLineWidth(560);
+    dashed.SetDashedLinePattern(Vector2<float>(9.25f, 8));
+    struct {
+        char const* what;
+        float left, top;
+        std::function<void(IMKCanvas&)> draw;
+    } const cases[] = {
+        {"large circle", 1060, 980, [&](auto& c) { c.DrawCircle(700.25f, 1000.5f, 400, &filled); }},
+        {"large ring", 1060, 980, [&](auto& c) { c.DrawCircle(700.25f, 1000.5f, 400, &paint); }},
+        {"circle far away", 3000, 2000, [&](auto& c) { c.DrawCircle(3040.3f, 2040.7f, 30.25f, &filled); }},
+        {"ring far away", 3000, 2000, [&](auto& c) { c.DrawCircle(3040.3f, 2040.7f, 30.25f, &paint); }},
+        {"wide cap", 1745, 190, [&](auto& c) { c.DrawLine(400, 220, 1750, 500, &wide); }},
+        {"dashes far from the start", 2920, 290, [&](auto& c) { c.DrawLine(4, 100.5f, 2990, 340, &dashed); }},
+    };
+    for (auto const& one : cases) {
+        ExpectLikeReference({MakeBackdrop(90, 80),
+                             [&](IMKCanvas& canvas, Scenes::SceneStage&) {
+                                 canvas.PreTranslate(-one.left, -one.top);
+                                 one.draw(canvas);
+                             }},
+                            one.what);
+    }
+}
+
 } // namespace
 } // namespace Moka::Testing

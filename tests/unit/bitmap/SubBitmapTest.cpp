@@ -106,33 +106,5 @@ TEST_F(SubBitmap, ACloneKeepsItsFrameBufferOnlyWhenTheSourceHasNone) {
     EXPECT_EQ(RendererFactory::GetStatistics().renderTargets, 2) << "the source's and the first clone's";
 }
 
-TEST_F(SubBitmap, TheRenderThreadFlavourDoesEverythingAtOnceAndCountsNothing) {
-    OnRenderThread const here;
-    Pixels const pixels = UniquePixels(4, 4);
-    auto strip = RefPtr<IMKSubBitmap>::Adopt(
-        new MKSubBitmapRT(&queue, 0, Rect(0, 0, 4, 4), 4, 4, pixels.data(), false));
-    Seen seen;
-    strip->GetPixelAsync(Point(1, 1), &seen, Seen::OnPixel);
-    EXPECT_EQ(seen.pixel, PixelAt(pixels, 4, 1, 1)) << "called before the return";
-    Pixels all(64);
-    strip->GetBitmapDataAsync(Rect(0, 0, 4, 4), all.data(), &seen, Seen::OnData);
-    EXPECT_EQ(seen.calls, 2);
-    EXPECT_EQ(all, pixels);
-    strip->CreateFrameBuffer();
-    strip->AttachDepthBuffer();
-    strip->SetTag(std::string(200, 'y').c_str());
-    EXPECT_EQ(strip->GetTexture()->GetLabel(), std::string(200, 'y')) << "only the caller-side tag is cut";
-    Pixels const white(64, 255);
-    strip->UpdateBitmap(Rect(0, 0, 2, 2), white.data(), 8);
-    auto clone = RefPtr<IMKSubBitmap>::Adopt(strip->Clone());
-    EXPECT_EQ(RendererFactory::GetStatistics().renderTargets, 1) << "the source's, not the clone's";
-    EXPECT_EQ(clone->GetPixel(Point(1, 1)), 0xFFFFFFFFu);
-    EXPECT_EQ(CountOf(strip.Get()) + CountOf(clone.Get()), 2);
-    strip = {};
-    clone = {};
-    EXPECT_EQ(queue.GetPostedCount(), 0);
-    EXPECT_EQ(RendererTrace::CountLiveObjects(), 0);
-}
-
 } // namespace
 } // namespace Moka::Testing

@@ -1,9 +1,8 @@
-// Tasks: what they store, what they call, who frees them.
+// The order of the virtual functions of interfaces that callers were built against.
 #include "moka/graphics/task/WorkerTask.h"
 
 #include "moka/renderer/IRenderTarget.h"
 #include "moka/renderer/IRendererDeviceCaps.h"
-#include "tests/support/Queues.h"
 
 #include <cstdint>
 #include <cstring>
@@ -11,34 +10,6 @@
 
 namespace Moka {
 namespace {
-
-using Testing::RefusingQueue;
-
-// Counts the living ones, copies among them.
-struct Tracked {
-    static inline int alive = 0;
-    Tracked() { ++alive; }
-    Tracked(Tracked const&) { ++alive; }
-    Tracked& operator=(Tracked const&) = delete;
-    ~Tracked() { --alive; }
-};
-
-struct Target {
-    void ByValue(Tracked) { ++runs; }
-    int runs = 0;
-};
-
-TEST(WorkerTask, ARefusedTaskIsFreedAndNeverRuns) {
-    RefusingQueue queue;
-    Target target;
-    {
-        Tracked const value;
-        EXPECT_FALSE(WorkerTask::PostMember(&queue, &target, &Target::ByValue, value));
-    }
-    EXPECT_EQ(Tracked::alive, 0);
-    EXPECT_EQ(target.runs, 0);
-    EXPECT_EQ(queue.GetRefusedCount(), 1);
-}
 
 // Where a virtual function stands in its table: in the Itanium ABI a pointer to one holds its offset plus
 // one.

@@ -1,5 +1,4 @@
 // Behaviour of docs/compatibility.md that no other test sees.
-#include "moka/graphics/loader/MKBitmapSaveManager.h"
 #include "tests/unit/canvas/CanvasFixture.h"
 
 namespace Moka::Testing {
@@ -42,14 +41,6 @@ TEST_F(Compatibility, SamplingOfATextureBitmapDropsNoReference) {
     bitmap->GetBitmapReadable()->SetTextureFilterRT(TextureFilterNearest, true);
     bitmap->GetBitmapReadable()->SetTextureWrapRT(TextureWrapRepeat, true);
     EXPECT_EQ(CountOf(bitmap.Get()), 1);
-}
-
-TEST_F(Compatibility, ASaveThatTheLoaderRefusesStaysCounted) {
-    auto const empty = BitmapPtr::Adopt(
-        MKGraphicsFactory::CreateBitmap(&queue, reinterpret_cast<TextureObject const*>(this), 1));
-    MKBitmapSaveManager manager;
-    EXPECT_FALSE(manager.RequestSave(1, "a.png", *empty, nullptr, 100));
-    EXPECT_EQ(manager.GetRequestSaveCount(), 1);
 }
 
 } // namespace

@@ -31,15 +31,6 @@ TEST_F(FrontEnd, ARequestHasTheMatrixOfItsTimeAndWithoutAPaintANewOne) {
     EXPECT_EQ(draw.state.blend.GetColorEquation().destination, BlendingFactor::OneMinusSrcAlpha);
 }
 
-TEST_F(FrontEnd, ARoundRectangleNeedsBothRadii) {
-    for (auto const& [rx, ry] : {std::pair(0.0f, 5.0f), {5.0f, 0.0f}, {5.0f, -1.0f}, {kNaN, 5.0f}}) {
-        canvas->DrawRoundRect(1, 2, 30, 40, rx, ry, &paint);
-        EXPECT_EQ(TakeDraw().shader, "MKRectShader");
-    }
-    canvas->DrawRoundRect(1, 2, 30, 40, 3, 5, &paint);
-    EXPECT_THAT(TakeDraws(), SizeIs(2)) << "body and corners";
-}
-
 TEST_F(FrontEnd, SavedLevelsHoldMatrixAndClipCountOrThePreviousOnes) {
     auto const clip = [&] { canvas->SetClipRect(0, 0, 10, 10, IMKCanvasBase::Intersect); };
     auto const move = [&] { canvas->PreTranslate(1, 0); };
@@ -146,62 +137,6 @@ TEST_F(FrontEnd, RefusedRequestsAreDroppedAndOnlyTheReferencesStay) {
     PipelineState const state = TakeDraw().state;
     EXPECT_TRUE(state.scissorOn);
     EXPECT_EQ(state.scissor.width, 0);
-}
-
-TEST_F(FrontEnd, WhatWasRefusedLeavesItsReferencesAndObjectsBehind) {
-    canvas = {};
-    auto bitmap = NewBitmap(4, 4);
-    auto const screen = NewScreen(4, 4);
-    queue.RunAll();
-    IMKSubBitmap* const strip = StripOf(bitmap);
-    int const alive = RendererTrace::CountLiveObjects();
-    refuse = true;
-    strip->SetTag("never seen");
-    EXPECT_EQ(strip->GetPixel(Point(1, 1)), 0u);
-    EXPECT_EQ(CountOf(strip), 3);
-    EXPECT_EQ(screen->GetPixel(Point(1, 1)), 0u);
-    screen->GetBitmapWritable()->ActivateFrameBuffer();
-    EXPECT_EQ(CountOf(screen.Get()), 3);
-    auto clone = BitmapPtr::Adopt(MKGraphicsFactory::CreateBitmap(&queue, bitmap.Get(), 1));
-    EXPECT_EQ(CountOf(clone.Get()), 2);
-    EXPECT_EQ(CountOf(StripOf(clone)), 2);
-    EXPECT_EQ(CountOf(strip), 4);
-    // What the refusals have leaked.
-    clone->Unref();
-    StripOf(clone)->Unref();
-    for (int i = 0; i < 3; ++i) strip->Unref();
-    for (int i = 0; i < 2; ++i) screen->Unref();
-    refuse = false;
-    clone = {};
-    queue.RunAll();
-    ITextureObject* const texture = strip->GetTexture();
-    refuse = true;
-    bitmap = {};
-    refuse = false;
-    EXPECT_EQ(RendererTrace::CountLiveObjects(), alive) << "the texture, whose deletion was refused";
-    OnRenderThread const here;
-    delete texture;
-}
-
-TEST_F(FrontEnd, ARefusedDeletionLeavesTheRenderSideAlive) {
-    canvas = {};
-    queue.RunAll();
-    int held = 0;
-    RefusingQueue some(RefusingQueue::Predicate([&](int ordinal, ITask* task) {
-        if (ordinal == 1) return false; // creates the clip
-        held = CountOf(target.Get());
-        OnRenderThread const here;
-        task->run(); // which gives its references back
-        return true;
-    }));
-    auto onSome = CanvasPtr::Adopt(MKGraphicsFactory::CreateCanvas(&some, target.Get(), 1));
-    {
-        OnRenderThread const here;
-        some.RunAll();
-    }
-    onSome = {};
-    EXPECT_EQ(held, 3);
-    EXPECT_EQ(some.GetRefusedCount(), 1);
 }
 
 TEST_F(FrontEnd, ARequestAllocatesNothingButItsTask) {

@@ -22,18 +22,5 @@ TEST(PaintTest, ColoursUnpackFromArgbAndThreeComponentsKeepTheAlpha) {
     EXPECT_EQ(paint.GetAlpha(), 7.0f);
 }
 
-TEST(PaintTest, EveryTintSetsTheFlagAndClearingTakesBothAway) {
-    MKPaint paint;
-    paint.SetTintColor(0x11223344);
-    EXPECT_TRUE(paint.HasTintColor());
-    EXPECT_EQ(paint.GetTintColor(), Color(0x22 / 255.0f, 0x33 / 255.0f, 0x44 / 255.0f, 0x11 / 255.0f));
-    EXPECT_EQ(paint.GetColor(), Color(1, 1, 1, 1));
-    paint.ClearTintColor();
-    EXPECT_FALSE(paint.HasTintColor());
-    EXPECT_EQ(paint.GetTintColor(), Color());
-    paint.SetTintColor(0, 0, 0, 0);
-    EXPECT_TRUE(paint.HasTintColor());
-}
-
 } // namespace
 } // namespace Moka::Testing
