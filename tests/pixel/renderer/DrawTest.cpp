@@ -111,6 +111,28 @@ TEST_P(DrawTest, AFullListIsSubmittedAndASecondFrameNeitherQueriesNorGrowsAnythi
     target->Deactivate(false, false);
 }
 
+// The copy of the target flushes the list that the vertices fill.
+TEST_P(DrawTest, AnImageIsDrawnOntoItselfWithMoreVerticesThanAListHolds) {
+    BlendStateDescriptor add(true);
+    add.SetColorEquation(BlendingFunction::Add, BlendingFactor::One, BlendingFactor::One);
+    blend->SetDescriptor(add);
+    target->Activate();
+    blend->Apply();
+    Fill({100, 0, 0, 255}, 0, 0, 8, 8);
+    int const unit = 1;
+    texture->Bind(unit);
+    textured->program->MakeCurrent();
+    textured->parameter->Set(&unit);
+    std::vector<float> corners{0, 0, 0, 8, 8, 0, 8, 0, 0, 8, 8, 8};
+    corners.resize(300000); // the others are a point
+    quad->SetVertices(0, corners.data(), 150000);
+    EXPECT_TRUE(quad->Draw(0, -1, 1));
+    Fill(kGreen, 0, 0, 2, 2);
+    EXPECT_EQ(Read(), With(Filled({200, 0, 0, 255}), {200, 255, 0, 255}, 0, 0, 2, 2));
+    target->Deactivate(false, false);
+    RendererFactory::Flush(); // takes the copy away
+}
+
 INSTANTIATE_TEST_SUITE_P(ImmediateAndDeferred, DrawTest, ::testing::Bool(), GetDrawMode);
 
 } // namespace
