@@ -252,14 +252,15 @@ TEST_F(StrokeTest, StripsCutWithoutATraceAndStencilsNotAtAll) {
 }
 
 TEST_F(StrokeTest, AppendingPieceByPieceDrawsTheSameStroke) {
+    MKPaint half; // so that what is drawn twice shows
+    half.SetAlpha(0.5f);
     for (Shape const& shape : kShapes) {
         Points const points = shape.make(14);
-        Picture const whole = Draw(OneStroke(points, Matrix3f()));
+        Picture const whole = Draw(OneStroke(points, Matrix3f(), half));
         Picture const pieces =
             Draw({Picture(kWidth, kHeight), [&](IMKCanvas& canvas, Scenes::SceneStage& stage) {
                       auto const stroke = MakeStroke(stage, {{1, 1, 30}});
-                      MKPaint const paint;
-                      canvas.Draw(stroke.Get(), &paint);
+                      canvas.Draw(stroke.Get(), &half);
                       stroke->Clear();
                       int left = static_cast<int>(points.size());
                       for (MKStrokePoint const& point : points) {
@@ -268,10 +269,10 @@ TEST_F(StrokeTest, AppendingPieceByPieceDrawsTheSameStroke) {
                           // At two scales in turn, so that both meshes grow.
                           canvas.ClearAll(0);
                           canvas.PreScale(0.3f, 0.3f);
-                          canvas.Draw(stroke.Get(), &paint);
+                          canvas.Draw(stroke.Get(), &half);
                           canvas.SetMatrix(Matrix3f());
                           canvas.ClearAll(0);
-                          canvas.Draw(stroke.Get(), &paint);
+                          canvas.Draw(stroke.Get(), &half);
                       }
                   }});
         Slack const slack(kWidth, kHeight, 1);

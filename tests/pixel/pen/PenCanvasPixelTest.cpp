@@ -187,6 +187,7 @@ TEST_P(PenCanvasPixel, OwnDrawsBeforeAndAfterAreRightWhateverIsLeftBehind) {
     canvas->Restore(-1);
     ExpectPicture("clipped around ink");
     DrawInkAt(4);
+    DrawInkAt(5); // with nothing of the library's in between
     DrawPicture(33, 20, MakeGradient(5, 3));
     ExpectPicture("uploaded after ink");
 }

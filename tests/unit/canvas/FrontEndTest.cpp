@@ -29,6 +29,9 @@ TEST_F(FrontEnd, ARequestHasTheMatrixOfItsTimeAndWithoutAPaintANewOne) {
     EXPECT_EQ(draw.state.scissor, (ScissorRect{5, 6, 10, 10}));
     EXPECT_THAT(draw.uniforms.at("uColor").numbers, ElementsAre(1, 1, 1, 1));
     EXPECT_EQ(draw.state.blend.GetColorEquation().destination, BlendingFactor::OneMinusSrcAlpha);
+    canvas->SetMatrix(m);
+    canvas->DrawRoundRect(-90, -90, 90, 90, 5, 0, &paint);
+    EXPECT_EQ(TakeDraw().shader, "MKRectShader") << "a radius of 0 makes no corners";
 }
 
 TEST_F(FrontEnd, SavedLevelsHoldMatrixAndClipCountOrThePreviousOnes) {
