@@ -165,23 +165,5 @@ TEST_F(Load, ACpuBitmapDiesOnItsQueueBehindTheCallbacks) {
     EXPECT_EQ(pumped.RunAll(), 1) << "a cancelled load's, too";
 }
 
-TEST_F(Load, WaitersForLoadsAreAllLetGo) {
-    String const path = WritePicture("a.mki");
-    CodecGate gate;
-    Request(1, path);
-    gate.AwaitArrival();
-    std::vector<std::thread> waiters;
-    for (int i = 0; i < 3; ++i)
-        waiters.emplace_back([this] {
-            Loader().WaitUntilMsgQueueRequired();
-            EXPECT_EQ(listener.GetEvents().size(), 3u);
-        });
-    std::string const line = "WaitUntilMsgQueueRequired - LoadTaskRunning -> Start Wait";
-    log.AwaitLines(line, 3);
-    gate.Open();
-    for (std::thread& waiter : waiters) waiter.join();
-    EXPECT_GE(log.Count(ANDROID_LOG_INFO, "WaitUntilMsgQueueRequired - LoadTaskRunning -> End Wait"), 3);
-}
-
 } // namespace
 } // namespace Moka::Testing
