@@ -3,6 +3,7 @@
 #include "moka/base/log/AndroidLog.h"
 #include "moka/graphics/drawable/MKStrokeDrawable.h"
 #include "tests/pixel/canvas/CanvasDrawing.h"
+#include "tests/support/reference/Plane.h"
 
 #include <cmath>
 #include <random>
@@ -20,45 +21,19 @@ constexpr int kHeight = 100;
 constexpr int kClose = 14;
 constexpr int kFar = 24;
 
-struct Place {
-    double x;
-    double y;
-};
-
-// The canvas's pixels at the target's.
-class Inverse {
-public:
-    explicit Inverse(Matrix3f const& matrix) {
-        auto const at = [&](int row, int column) { return double{matrix(row % 3, column % 3)}; };
-        for (int i = 0; i < 3; ++i) {
-            for (int j = 0; j < 3; ++j) {
-                mValues[i][j] = at(j + 1, i + 1) * at(j + 2, i + 2) - at(j + 1, i + 2) * at(j + 2, i + 1);
-            }
-        }
-    }
-
-    Place Find(double x, double y) const {
-        auto const at = [&](int row) { return mValues[row][0] * x + mValues[row][1] * y + mValues[row][2]; };
-        return {at(0) / at(2), at(1) / at(2)};
-    }
-
-private:
-    double mValues[3][3]; // times the determinant
-};
-
 // A pixel's centre on the canvas, and how long the pixel is there along the target's axes.
 struct Pixel {
-    Pixel(Inverse const& inverse, double x, double y) : center(inverse.Find(x, y)) {
+    Pixel(Transform const& transform, double x, double y) : center(*transform.Unmap({x, y})) {
         constexpr double kStep = 1e-4;
-        Place const beside = inverse.Find(x + kStep, y);
-        Place const below = inverse.Find(x, y + kStep);
+        PointD const beside = *transform.Unmap({x + kStep, y});
+        PointD const below = *transform.Unmap({x, y + kStep});
         right = {(beside.x - center.x) / kStep, (beside.y - center.y) / kStep};
         down = {(below.x - center.x) / kStep, (below.y - center.y) / kStep};
     }
 
-    Place center;
-    Place right;
-    Place down;
+    PointD center;
+    PointD right;
+    PointD down;
 };
 
 double Cover(MKStrokePoint const& a, MKStrokePoint const& b, Pixel const& pixel) {
@@ -90,10 +65,10 @@ double Cover(MKStrokePoint const& a, MKStrokePoint const& b, Pixel const& pixel)
 
 Picture DrawReferenceStroke(Points const& points, Matrix3f const& matrix) {
     Picture picture(kWidth, kHeight);
-    Inverse const inverse(matrix);
+    Transform const transform(matrix);
     for (int y = 0; y < kHeight; ++y) {
         for (int x = 0; x < kWidth; ++x) {
-            Pixel const pixel(inverse, x + 0.5, y + 0.5);
+            Pixel const pixel(transform, x + 0.5, y + 0.5);
             double most = 0;
             for (std::size_t i = 0; i < points.size() && most < 1; ++i) {
                 most = std::max(most, Cover(points[i], points[std::min(i + 1, points.size() - 1)], pixel));
