@@ -205,6 +205,7 @@ TEST(SceneFormat, AMistakeInTheFileIsNamedWithItsPlace) {
     ExpectNamed({
         {"", "1:1: this is no JSON: syntax error"},
         {"{\n\"size\": [8, 6],\n}", "3:1: this is no JSON: syntax error"},
+        {"{\"size\": tru\n}", "1:13: this is no JSON: syntax error"}, // the line break belongs to its line
         {"{\n\"size\": [8, 1e999]}", "2:13: this is no JSON: number overflow"},
         {"{\n\n\"size\": [8, 1e39]}", "3:13: a number is too large"},
         {"{\"size\": [8, 6],\n  \"size\": [8, 6]}", "2:3: \"size\" is given twice"},
