@@ -30,10 +30,6 @@ constexpr Texts kWide{"wide",
                       "precision highp float; uniform vec4 color; void main() { gl_FragColor = color; }"};
 
 constexpr Texts kPrograms[] = {
-    {"precision statements", MOKA_PLAIN,
-     "precision lowp float; precision mediump int; precision highp float;"
-     "uniform vec4 color; uniform lowp vec2 pair; uniform mediump float number;"
-     "void main() { gl_FragColor = color * vec4(pair, number, 1.0); }"},
     {"comments", MOKA_PLAIN,
      "precision highp float;\nuniform /* ; */ highp // , }\n vec4 /**/ color /* { */ ; //uniform float "
      "gone;\n"
@@ -48,13 +44,11 @@ constexpr Texts kPrograms[] = {
                  "void main() { at = uv * number; gl_Position = vec4(corner, color.x * 0.1, 1.0); }",
      "precision highp float; uniform vec4 color; uniform float number; varying vec2 at;"
      "void main() { gl_FragColor = vec4(at, number, color.y); }"},
-    {"names in a row", MOKA_PLAIN,
-     "uniform highp vec4 color,other /* two */, unused;\nuniform highp float number; void main()"
-     "{ gl_FragColor = color + other * number; }"},
-    {"hidden by a local variable", MOKA_PLAIN,
-     "precision highp float; uniform vec4 color; uniform float number;"
+    {"precision statements, names in a row, and one hidden by a local variable", MOKA_PLAIN,
+     "precision lowp float; precision mediump int; precision highp float;"
+     "uniform lowp vec4 color,other /* two */, unused; uniform mediump float number;"
      "float hide() { float number = 0.25; { vec2 color = vec2(number); number = color.x; } return number; }"
-     "void main() { gl_FragColor = color * hide() + number * 0.5; }"},
+     "void main() { gl_FragColor = color * hide() + other * number * 0.5; }"},
     {"hidden by a parameter", MOKA_PLAIN,
      "precision highp float; uniform vec4 color, other;"
      "vec4 turn(vec4 other, inout vec4 color) { color = color * 0.5; return other.bgra; }"

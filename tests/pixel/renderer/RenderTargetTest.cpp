@@ -175,28 +175,5 @@ TEST_F(RenderTargetTest, WhatDoesNotFitIsRefusedWithALine) {
     EXPECT_EQ(TakeErrors().size(), 3u);
 }
 
-TEST_F(RenderTargetTest, AClipThatComesBackFindsTheSameRenderBufferAmongTheLastFew) {
-    OffscreenImage const image = MakeOffscreen(MakeImage(4, 4));
-    GLint first = 0;
-    for (int i = 0; i < 3; ++i) {
-        DepthStencilPtr const buffer = MakeDepthStencil(4, 4);
-        EXPECT_EQ(RendererFactory::GetStatistics().renderBuffers, 1);
-        EXPECT_EQ(RendererFactory::GetStatistics().pooledRenderBuffers, 0);
-        image.target->AttachDepthStencil(buffer.get());
-        if (i == 0) first = GetAttachment(image);
-        EXPECT_EQ(GetAttachment(image), first);
-        image.target->DetachDepthStencil();
-    }
-    std::vector<DepthStencilPtr> others;
-    for (int i = 5; i <= 25; ++i) others.push_back(MakeDepthStencil(i % 2 ? i : 4, i % 2 ? 4 : i));
-    EXPECT_EQ(RendererFactory::GetStatistics().pooledRenderBuffers, 1);
-    others.clear();
-    int const waiting = RendererFactory::GetStatistics().pooledRenderBuffers;
-    EXPECT_GE(waiting, 1);
-    EXPECT_LE(waiting, 8);
-    DepthStencilPtr const last = MakeDepthStencil(25, 4);
-    EXPECT_EQ(RendererFactory::GetStatistics().pooledRenderBuffers, waiting - 1);
-}
-
 } // namespace
 } // namespace Moka::Testing
