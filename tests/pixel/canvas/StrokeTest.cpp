@@ -93,61 +93,45 @@ Drawing OneStroke(Points const& points, Matrix3f const& matrix, MKPaint const& p
             }};
 }
 
-Points Wave(float width) {
-    Points points;
-    for (int i = 0; i <= 80; ++i) {
-        float const t = static_cast<float>(i) / 80;
-        points.push_back({8 + 104 * t, 50 + 35 * std::sin(t * 9), width * (0.6f + 0.4f * std::cos(t * 7))});
-    }
-    return points;
-}
-
-// Crosses itself again and again, with points close to each other.
-Points Loops(float width) {
-    Points points;
-    for (int i = 0; i <= 200; ++i) {
-        float const t = static_cast<float>(i) / 200;
-        float const turn = t * 31;
-        points.push_back({28 + 64 * t + 20 * std::cos(turn), 50 + 28 * std::sin(turn), width});
-    }
-    return points;
-}
-
-Points Scribble(float width) {
-    std::mt19937 random(7);
-    std::uniform_real_distribution<float> x(8, 112);
-    std::uniform_real_distribution<float> y(8, 92);
-    Points points;
-    for (int i = 0; i < 30; ++i) points.push_back({x(random), y(random), width});
-    return points;
-}
-
+// Points of width 1 at most.
 struct Shape {
     char const* name;
-    Points (*make)(float width);
+    Points points;
+
+    Points Widened(float width) const {
+        Points widened = points;
+        for (MKStrokePoint& point : widened) point.width *= width;
+        return widened;
+    }
 };
 
-constexpr Shape kShapes[] = {
-    {"straight",
-     [](float width) -> Points {
-         return {{14.3f, 20.7f, width}, {100.2f, 76.1f, width}};
-     }},
-    {"sharp",
-     [](float width) -> Points {
-         return {{12, 45, width}, {105, 38, width}, {15, 50, width}, {100, 88, width}, {99, 12, width}};
-     }},
-    {"taper",
-     [](float width) -> Points {
-         return {{20, 20, 0}, {60, 78, width}, {108, 26, width / 4}};
-     }},
-    {"dot",
-     [](float width) -> Points {
-         return {{60.5f, 46.25f, width}, {60.5f, 46.25f, width}};
-     }},
-    {"wave", Wave},
-    {"loops", Loops},
-    {"scribble", Scribble},
-};
+// Crosses itself again and again, with points close to each other.
+Shape MakeLoops() {
+    Shape loops{"loops", {}};
+    for (int i = 0; i <= 200; ++i) {
+        float const t = static_cast<float>(i) / 200;
+        loops.points.push_back({28 + 64 * t + 20 * std::cos(t * 31), 50 + 28 * std::sin(t * 31), 1});
+    }
+    return loops;
+}
+
+std::vector<Shape> MakeShapes() {
+    Shape wave{"wave", {}}, scribble{"scribble", {}};
+    for (int i = 0; i <= 80; ++i) {
+        float const t = static_cast<float>(i) / 80;
+        wave.points.push_back({8 + 104 * t, 50 + 35 * std::sin(t * 9), 0.6f + 0.4f * std::cos(t * 7)});
+    }
+    std::mt19937 random(7);
+    std::uniform_real_distribution<float> x(8, 112), y(8, 92);
+    for (int i = 0; i < 30; ++i) scribble.points.push_back({x(random), y(random), 1});
+    return {{"straight", {{14.3f, 20.7f, 1}, {100.2f, 76.1f, 1}}},
+            {"sharp", {{12, 45, 1}, {105, 38, 1}, {15, 50, 1}, {100, 88, 1}, {99, 12, 1}}},
+            {"taper", {{20, 20, 0}, {60, 78, 1}, {108, 26, 0.25f}}},
+            {"dot", {{60.5f, 46.25f, 1}, {60.5f, 46.25f, 1}}},
+            MakeLoops(),
+            wave,
+            scribble};
+}
 
 class StrokeTest : public CanvasDrawing {
 protected:
@@ -172,9 +156,9 @@ protected:
 };
 
 TEST_F(StrokeTest, CoverageIsTheMaximumOfTheSegments) {
-    for (Shape const& shape : kShapes) {
+    for (Shape const& shape : MakeShapes()) {
         for (float const width : {0.2f, 1.0f, 3.0f, 12.0f, 60.0f, 200.0f}) {
-            ExpectStroke(shape.make(width), Matrix3f(),
+            ExpectStroke(shape.Widened(width), Matrix3f(),
                          shape.name + std::string(" ") + std::to_string(width));
         }
     }
@@ -194,11 +178,11 @@ TEST_F(StrokeTest, EdgesAreOneDevicePixelUnderAnyMatrix) {
     };
     int number = 0;
     for (Matrix3f const& matrix : matrices) {
-        for (Shape const& shape : kShapes) {
+        for (Shape const& shape : MakeShapes()) {
             // Each shape and each matrix with each width.
             constexpr float kWidths[] = {0.5f, 4, 40};
             float const width = kWidths[number++ % 3];
-            ExpectStroke(shape.make(width), matrix,
+            ExpectStroke(shape.Widened(width), matrix,
                          shape.name + std::string(" under matrix ") + std::to_string(&matrix - matrices));
         }
     }
@@ -215,7 +199,7 @@ TEST_F(StrokeTest, StripsCutWithoutATraceAndStencilsNotAtAll) {
                 canvas.SetMatrix(Matrix3f());
             }
             canvas.PreScale(0.37f, 1.1f);
-            canvas.Draw(MakeStroke(stage, Loops(12)).Get(), &paint);
+            canvas.Draw(MakeStroke(stage, MakeLoops().Widened(12)).Get(), &paint);
         };
     };
     Picture const start = MakeBackdrop(40, 110);
@@ -229,8 +213,8 @@ TEST_F(StrokeTest, StripsCutWithoutATraceAndStencilsNotAtAll) {
 TEST_F(StrokeTest, AppendingPieceByPieceDrawsTheSameStroke) {
     MKPaint half; // so that what is drawn twice shows
     half.SetAlpha(0.5f);
-    for (Shape const& shape : kShapes) {
-        Points const points = shape.make(14);
+    for (Shape const& shape : MakeShapes()) {
+        Points const points = shape.Widened(14);
         Picture const whole = Draw(OneStroke(points, Matrix3f(), half));
         Picture const pieces =
             Draw({Picture(kWidth, kHeight), [&](IMKCanvas& canvas, Scenes::SceneStage& stage) {

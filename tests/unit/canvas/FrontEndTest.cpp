@@ -34,51 +34,42 @@ TEST_F(FrontEnd, ARequestHasTheMatrixOfItsTimeAndWithoutAPaintANewOne) {
     EXPECT_EQ(TakeDraw().shader, "MKRectShader") << "a radius of 0 makes no corners";
 }
 
+// A, M and C save all, the matrix or the clip, U with an unknown flag; > moves by 1, # clips; a digit restores that
+// level, - the last one, ~ level -2.
 TEST_F(FrontEnd, SavedLevelsHoldMatrixAndClipCountOrThePreviousOnes) {
-    auto const clip = [&] { canvas->SetClipRect(0, 0, 10, 10, IMKCanvasBase::Intersect); };
-    auto const move = [&] { canvas->PreTranslate(1, 0); };
-    auto const x = [&] { return canvas->GetMatrix().getTranslateX(); };
-    // Whether the clip of a draw right now is on.
-    auto const isClipped = [&] {
+    struct {
+        char const* steps;
+        float x;
+        bool isClipped;
+    } const cases[] = {
+        {"-0>", 1, false},           // there is none
+        {">A>#MCU>4", 3, true},      // nor this one
+        {">A>#MCU>3", 2, true},      // the matrix of level 1, the count of level 2
+        {">A>#MCU>3>1", 2, false},   // level 1 had the count of level 0
+        {">A>#MCU>3>1~-", 1, false}, // any negative level is the last one
+        {">#C0", 0, true},           // saving one part alone resets the other
+        {"M#-", 0, false},
+    };
+    for (auto const& [steps, x, isClipped] : cases) {
+        Use(NewBitmap(50, 50));
+        int levels = 0;
+        for (char const* step = steps; *step != 0; ++step) {
+            std::size_t const flag = std::string("AMCU").find(*step);
+            if (flag != std::string::npos)
+                EXPECT_EQ(canvas->Save(static_cast<IMKCanvasBase::SaveFlag>(flag)), levels++) << steps;
+            else if (*step == '>')
+                canvas->PreTranslate(1, 0);
+            else if (*step == '#')
+                canvas->SetClipRect(0, 0, 10, 10, IMKCanvasBase::Intersect);
+            else
+                canvas->Restore(*step == '-' ? -1 : *step == '~' ? -2 : *step - '0');
+        }
+        EXPECT_EQ(canvas->GetMatrix().getTranslateX(), x) << steps;
         queue.RunAll();
         RendererTrace::TakeEvents();
         canvas->DrawRect(-99, -99, 99, 99, &paint);
-        return TakeDraw().state.scissorOn;
-    };
-    canvas->Restore(-1);
-    canvas->Restore(0);
-    move();
-    EXPECT_EQ(canvas->Save(IMKCanvasBase::SaveAll), 0);
-    move();
-    clip();
-    EXPECT_EQ(canvas->Save(IMKCanvasBase::SaveMatrix), 1);
-    EXPECT_EQ(canvas->Save(IMKCanvasBase::SaveClip), 2);
-    EXPECT_EQ(canvas->Save(static_cast<IMKCanvasBase::SaveFlag>(3)), 3);
-    move();
-    canvas->Restore(4);
-    EXPECT_EQ(x(), 3);
-    EXPECT_TRUE(isClipped());
-    canvas->Restore(3);
-    EXPECT_EQ(x(), 2) << "the matrix of level 1, through 2";
-    EXPECT_TRUE(isClipped()) << "the count of level 2";
-    move();
-    canvas->Restore(1);
-    EXPECT_EQ(x(), 2);
-    EXPECT_FALSE(isClipped()) << "level 1 had the count of level 0";
-    canvas->Restore(-2);
-    EXPECT_EQ(x(), 1);
-    canvas->Restore(-1);
-    EXPECT_EQ(x(), 1);
-
-    clip(); // saving one part alone resets the other
-    EXPECT_EQ(canvas->Save(IMKCanvasBase::SaveClip), 0);
-    canvas->Restore(0);
-    EXPECT_TRUE(canvas->GetMatrix().isIdentity());
-    EXPECT_TRUE(isClipped());
-    canvas->Save(IMKCanvasBase::SaveMatrix);
-    clip();
-    canvas->Restore(-1);
-    EXPECT_FALSE(isClipped());
+        EXPECT_EQ(TakeDraw().state.scissorOn, isClipped) << steps;
+    }
 }
 
 TEST_F(FrontEnd, ASourceIsHeldUntilDrawnAndWhatCannotBeDrawnIsNotPosted) {

@@ -19,14 +19,13 @@ struct PngKind {
 };
 
 std::vector<PngKind> AllKinds() {
-    std::pair<int, std::vector<int>> const types[] = {{PNG_COLOR_TYPE_GRAY, {1, 2, 4, 8, 16}},
-                                                      {PNG_COLOR_TYPE_PALETTE, {1, 2, 4, 8}},
-                                                      {PNG_COLOR_TYPE_RGB, {8, 16}},
-                                                      {PNG_COLOR_TYPE_GRAY_ALPHA, {8, 16}},
-                                                      {PNG_COLOR_TYPE_RGBA, {8, 16}}};
     std::vector<PngKind> kinds;
-    for (auto const& [type, depths] : types) {
-        for (int const depth : depths) {
+    for (int const type : {PNG_COLOR_TYPE_GRAY, PNG_COLOR_TYPE_PALETTE, PNG_COLOR_TYPE_RGB,
+                           PNG_COLOR_TYPE_GRAY_ALPHA, PNG_COLOR_TYPE_RGBA}) {
+        for (int const depth : {1, 2, 4, 8, 16}) {
+            bool const isSmall = depth < 8;
+            if (type != PNG_COLOR_TYPE_GRAY && depth != 8 && isSmall != (type == PNG_COLOR_TYPE_PALETTE))
+                continue;
             kinds.push_back({type, depth, false});
             if (!(type & PNG_COLOR_MASK_ALPHA)) kinds.push_back({type, depth, true});
         }
