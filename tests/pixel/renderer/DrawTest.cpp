@@ -64,22 +64,6 @@ TEST_P(DrawTest, CountsAndFirstAreCutToWhatIsThere) {
     target->Deactivate(false, false);
 }
 
-TEST_P(DrawTest, WithoutAProgramThatCompiledNothingIsDrawn) {
-    target->Activate();
-    SetQuad(0, 0, 8, 8);
-    EXPECT_FALSE(quad->Draw(0, -1, 1));
-    ProgramPtr const broken(RendererFactory::CreateShaderProgram("misspelt", kColored, "broken"));
-    EXPECT_EQ(TakeErrors().size(), 1u);
-    ForgetDriverErrors();
-    broken->MakeCurrent();
-    EXPECT_FALSE(quad->Draw(0, -1, 1));
-    Fill(kRed, 0, 0, 8, 8);
-    colored.reset(); // while it is in the list
-    EXPECT_FALSE(quad->Draw(0, -1, 1));
-    EXPECT_EQ(Read(), Filled(kRed));
-    target->Deactivate(false, false);
-}
-
 TEST_P(DrawTest, AFullListIsSubmittedAndASecondFrameNeitherQueriesNorGrowsAnything) {
     constexpr int kDraws = 50000; // several times what a list holds
     auto const drawFrame = [this] {
