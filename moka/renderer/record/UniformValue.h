@@ -10,13 +10,6 @@
 
 namespace Moka::detail {
 
-template <std::size_t kBytes>
-bool ReplaceBytes(unsigned char* kept, void const* value) {
-    if (HasSameBits<kBytes>(kept, value)) return false;
-    std::memcpy(kept, value, kBytes);
-    return true;
-}
-
 inline bool ReplaceWord(unsigned char* kept, void const* value) {
     std::uint32_t before;
     std::uint32_t now;
@@ -37,7 +30,9 @@ bool ReplaceValue(unsigned char* kept, void const* value) {
     } else if constexpr (kBytes == sizeof(std::uint32_t)) {
         return ReplaceWord(kept, value);
     } else {
-        return ReplaceBytes<kBytes>(kept, value);
+        if (HasSameBits<kBytes>(kept, value)) return false;
+        std::memcpy(kept, value, kBytes);
+        return true;
     }
 }
 
