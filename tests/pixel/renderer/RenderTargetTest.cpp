@@ -175,5 +175,17 @@ TEST_F(RenderTargetTest, WhatDoesNotFitIsRefusedWithALine) {
     EXPECT_EQ(TakeErrors().size(), 3u);
 }
 
+TEST_F(RenderTargetTest, ABufferThatGoesIsKeptForTheNextOfItsSizeAndOnlyTheLastFewAre) {
+    auto const countKept = [] { return RendererFactory::GetStatistics().pooledRenderBuffers; };
+    MakeDepthStencil(4, 4);
+    EXPECT_EQ(countKept(), 1);
+    DepthStencilPtr const other = MakeDepthStencil(4, 3);
+    EXPECT_EQ(countKept(), 1);
+    DepthStencilPtr const same = MakeDepthStencil(4, 4);
+    EXPECT_EQ(countKept(), 0);
+    for (int i = 5; i <= 25; ++i) MakeDepthStencil(i, 4);
+    EXPECT_LE(countKept(), 8);
+}
+
 } // namespace
 } // namespace Moka::Testing
