@@ -42,12 +42,12 @@ TEST_F(FrontEnd, SavedLevelsHoldMatrixAndClipCountOrThePreviousOnes) {
         float x;
         bool isClipped;
     } const cases[] = {
-        {"-0>", 1, false},           // there is none
-        {">A>#MCU>4", 3, true},      // nor this one
-        {">A>#MCU>3", 2, true},      // the matrix of level 1, the count of level 2
-        {">A>#MCU>3>1", 2, false},   // level 1 had the count of level 0
-        {">A>#MCU>3>1~-", 1, false}, // any negative level is the last one
-        {">#C0", 0, true},           // saving one part alone resets the other
+        {"-0>", 1, false},          // there is none
+        {">A>#MCU>4", 3, true},     // nor this one
+        {">A>#MCU>3", 2, true},     // the matrix of level 1, the count of level 2
+        {">A>#MCU>3>1", 2, false},  // level 1 had the count of level 0
+        {">A>#MCU>3>1~", 1, false}, // any negative level is the last one
+        {">#C0", 0, true},          // saving one part alone resets the other
         {"M#-", 0, false},
     };
     for (auto const& [steps, x, isClipped] : cases) {
