@@ -45,7 +45,7 @@ private:
 // program needs.
 class BareBatch {
 public:
-    // A covered rectangle has a coverage in each vertex, as the library's have.
+    // The vertices of a CoveredRect have a coverage, like the vertices of the library.
     enum class Shape { Rect, CoveredRect, Bitmap, Circle, Line };
 
     BareBatch(Shape shape, int size);
@@ -54,7 +54,7 @@ public:
 private:
     Shape const mShape;
     BareImage mTarget{kSide, kSide};
-    BareImage mSource; // of bitmaps
+    BareImage mSource; // the texture of Shape::Bitmap
     BareProgram mProgram;
     BareVertices mVertices{2, 4, 4};
     std::vector<float> mFloats;

@@ -54,14 +54,15 @@ public:
 private:
     class Touched;
 
-    // The product of the matrices of the last draw: neighbours mostly share both.
+    // The matrices of the last draw and their product. Consecutive draws mostly use the same two matrices.
     struct Projection {
         Matrix4<float> target;
         Matrix3<float> model;
         Matrix4<float> product;
     };
 
-    // From pixels before the model matrix to the target. Valid until the next call.
+    // Returns the matrix from model coordinates (pixels) to the target's clip coordinates. The reference is
+    // valid until the next call.
     Matrix4<float> const& Project(IMKBitmapWritable& target, Matrix3<float> const& model);
 
     void DrawWhole(IMKBitmap* src, RectF const& srcRect, RectF const& dstRect, Matrix3<float> const& m,

@@ -47,7 +47,7 @@ bool IsScaleAndTranslation(T const* m) {
     return m[1] == 0 && m[2] == 0 && m[3] == 0 && m[5] == 0 && m[8] == 1;
 }
 
-// Infinity and what is not a number differ from themselves here.
+// Infinity and NaN minus themselves are NaN, which does not equal 0.
 template <class T>
 bool AreFinite(T a, T b, T c, T d) {
     return (a - a) + (b - b) + (c - c) + (d - d) == 0;
@@ -55,7 +55,7 @@ bool AreFinite(T a, T b, T c, T d) {
 
 template <class T>
 void MapCorners(T const* m, T left, T top, T right, T bottom, RectF& box) {
-    // The zeros of such a matrix take no part, unless they meet infinity.
+    // The products with zero elements can be left out, except that 0 times infinity is NaN.
     if (IsScaleAndTranslation(m) && AreFinite(left, top, right, bottom)) {
         T const x0 = m[0] * left + m[6];
         T const x1 = m[0] * right + m[6];
@@ -322,7 +322,7 @@ void Matrix3<T>::mapRect(Rect* result, Rect const& source) const {
 
 template <class T>
 void Matrix3<T>::mapRect(RectF* result, RectF const& source) const {
-    RectF const from = source; // which result may be
+    RectF const from = source; // result may point to source
     MapCorners(mElements, from.left, from.top, from.right, from.bottom, *result);
 }
 

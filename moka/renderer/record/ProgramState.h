@@ -36,7 +36,8 @@ public:
     char const* GetHandleName(std::size_t handle) const { return mHandles[handle].name.c_str(); }
     // Returns true if the value changed.
     bool Set(std::size_t handle, void const* value);
-    // The same for a handle of that type; one that has another type now is left alone.
+    // Like Set(), for a handle of type kType. If the handle has another type now, it does nothing and returns
+    // false.
     template <BindingType kType>
     bool SetAs(std::size_t handle, void const* value) {
         Handle const& place = mHandles[handle];
