@@ -205,7 +205,13 @@ private:
 };
 
 thread_local unsigned theNamedIn = 0;
-thread_local char const* theTaskName = nullptr;
+
+// Of the task at hand and of the one before.
+struct TaskNames {
+    Trace::TaskName current;
+    char const* last;
+};
+thread_local TaskNames theTaskNames{};
 
 void StopAtExit() { Trace::Stop(nullptr); }
 
@@ -340,10 +346,17 @@ void Trace::Add(char const* category, char const* name, std::int64_t begin, std:
     Writer::Get(theIsOn).Add(event);
 }
 
-char const* Trace::TakeTaskName() noexcept { return std::exchange(theTaskName, nullptr); }
+Trace::TaskName Trace::TakeTaskName() noexcept {
+    TaskNames& names = theTaskNames;
+    names.last = names.current.name;
+    return {std::exchange(names.current.name, nullptr), names.current.changed};
+}
 
 void Trace::SetTaskName(char const* name) noexcept {
-    if (!theTaskName) theTaskName = name;
+    TaskNames& names = theTaskNames;
+    if (names.current.name) return;
+    names.current.name = name;
+    if (name != names.last) names.current.changed = GetTime();
 }
 
 } // namespace Moka

@@ -55,8 +55,12 @@ public:
     static void NameTask(char const* name) noexcept {
         if (IsOn()) SetTaskName(name);
     }
-    /// The name given since the last call, or null.
-    static char const* TakeTaskName() noexcept;
+    /// The name given since the last call, or null. Changed: when it was given, if it differs from the name before.
+    struct TaskName {
+        char const* name;
+        std::int64_t changed;
+    };
+    static TaskName TakeTaskName() noexcept;
 
 private:
     static void SetTaskName(char const* name) noexcept;

@@ -147,7 +147,7 @@ TEST(TraceTest, TellsOfEveryThreadTaskFlushTransferAndFileOnce) {
         // In one go, and one of them slow.
         Sleeper sleeper;
         queue->Call([&] {
-            for (int const milliseconds : {0, 0, 0, 2, 0, 0}) {
+            for (int const milliseconds : {0, 0, 0, 0, 0, 2, 0, 0, 0, 0, 0, 0}) {
                 WorkerTask::PostMember(queue.get(), &sleeper, &Sleeper::Sleep, milliseconds);
             }
         });
@@ -162,10 +162,10 @@ TEST(TraceTest, TellsOfEveryThreadTaskFlushTransferAndFileOnce) {
     EXPECT_EQ(events.Sum("task", "DrawRectRT", "count"), 9000);
     EXPECT_EQ(events.Sum("task", "ClearAllRT", "count"), 3);
     EXPECT_EQ(events.Sum("task", "CallTask", "count"), 1);
-    EXPECT_EQ(events.Sum("task", "Sleep", "count"), 6);
+    EXPECT_EQ(events.Sum("task", "Sleep", "count"), 12);
     for (json const& event : events.Find("task", "Sleep")) {
         bool const isSlow = event.at("dur").get<double>() >= 2000;
-        EXPECT_TRUE(!isSlow || event.at("args").at("count") == 1) << event;
+        EXPECT_TRUE(!isSlow || event.at("args").at("count") <= 8) << event;
     }
     EXPECT_EQ(events.Sum("renderer", "Flush", "draws"), static_cast<std::int64_t>(statistics.drawRequests));
     EXPECT_EQ(events.Sum("renderer", "Flush", "runs"), static_cast<std::int64_t>(statistics.draws));
