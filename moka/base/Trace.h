@@ -9,7 +9,7 @@
 /// Fails:   a file that cannot be opened is false with the reason. When writing fails later, one warning is
 ///          logged, the file is cut after the last event that fits, and tracing stops; the program goes on.
 /// Lost:    nothing that ended before Stop() or the normal end of the process. A scope that is open then is
-///          not in the file.
+///          not in the file, nor are the last tasks of one kind of a queue that is at work.
 #pragma once
 
 #include "moka/base/Export.h"
