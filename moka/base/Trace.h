@@ -8,8 +8,10 @@
 ///          writes it to the file.
 /// Text:    every `char const*` must stay valid until the trace has stopped, as string literals do.
 /// Fails:   Start returns false and the reason if the file cannot be opened. If writing fails later, it logs
-///          a warning, truncates the file after the last complete event, and stops tracing.
-/// Lost:    events that end after Stop() or at the exit of the process. All earlier events are in the file.
+///          a warning, truncates the file after the last event that fits, and stops tracing.
+/// Lost:    scopes that are still open at Stop() or at the exit of the process, and the last tasks of one
+/// kind of
+///          a queue that still runs. All earlier events are in the file.
 #pragma once
 
 #include "moka/base/Export.h"
@@ -56,8 +58,15 @@ public:
     static void NameTask(char const* name) noexcept {
         if (IsOn()) SetTaskName(name);
     }
-    /// Returns the name that was set since the last call, or null. A queue calls it after each task.
-    static char const* TakeTaskName() noexcept;
+    /// The name of a task.
+    /// name: the name that was set since the last call, or null.
+    /// changed: the time at which it was set, if it differs from the name before.
+    struct TaskName {
+        char const* name;
+        std::int64_t changed;
+    };
+    /// Returns the name that was set since the last call. A queue calls it after each task.
+    static TaskName TakeTaskName() noexcept;
 
 private:
     static void SetTaskName(char const* name) noexcept;

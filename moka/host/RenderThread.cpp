@@ -54,12 +54,13 @@ private:
     std::promise<bool> mResult; // owned here, so that the woken caller cannot destroy it while it is used
 };
 
-// Traces while a render thread runs. If MOKA_TRACE requests the trace, it lasts until the process ends.
+// Traces while a render thread runs. If MOKA_TRACE requests the trace, it lasts from the first render thread
+// on until the process ends.
 class ThreadTrace {
 public:
     explicit ThreadTrace(std::string const& path) : mIsOwn(!path.empty()) {
-        char const* const wanted = mIsOwn ? path.c_str() : std::getenv("MOKA_TRACE");
-        if (!wanted || !*wanted || (!mIsOwn && Trace::IsOn())) return;
+        char const* const wanted = mIsOwn ? path.c_str() : TakeEnvironment();
+        if (!wanted || !*wanted) return;
         std::string error;
         mIsOn = Trace::Start(wanted, &error);
         if (!mIsOn) __android_log_print(ANDROID_LOG_WARN, "mok_log", "RenderThread: %s", error.c_str());
@@ -74,6 +75,12 @@ public:
     }
 
 private:
+    // Once in a process: a file that could not be written or that filled the disk is told once.
+    static char const* TakeEnvironment() {
+        static std::atomic<bool> isTaken{false};
+        return Trace::IsOn() || isTaken.exchange(true) ? nullptr : std::getenv("MOKA_TRACE");
+    }
+
     bool const mIsOwn;
     bool mIsOn = false;
 };
