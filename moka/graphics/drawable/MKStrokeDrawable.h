@@ -49,7 +49,7 @@ public:
 
     /// Continues the stroke; the points are copied. Null or a count below 1 does nothing.
     void Append(MKStrokePoint const* points, int count);
-    /// Draws posted before still draw the old points.
+    /// Draws posted before still draw the old points. Keeps the memory for the next ones.
     void Clear();
 
     /// Encloses all points that were appended and kept, with their widths; empty without any. For the caller:

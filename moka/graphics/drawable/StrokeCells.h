@@ -35,6 +35,8 @@ public:
     // Of the segments, which are numbered from 0 on, the last one may be taken back.
     void Add(StrokeSegment const& segment, bool mayBeTakenBack);
     void TakeBackLast();
+    // Takes back all; keeps the memory.
+    void Clear();
 
     // Brings the cells up to date with the segments.
     std::vector<StrokeCell> const& Make();
@@ -111,7 +113,7 @@ private:
     std::vector<StrokeCell> mCells;
     std::vector<int> mNextCell; // of the same node, or free
     int mFreeCell = kNone;
-    std::vector<Candidate> mCandidates; // while cells are made
+    std::vector<Candidate> mCandidates; // while cells are made, or entries limited
     std::vector<Point> mPoints;         // of the cell that is made
 };
 

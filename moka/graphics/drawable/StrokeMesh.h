@@ -26,6 +26,9 @@ public:
     // Takes the points that it does not have yet; those before have not changed. There is at least one.
     std::vector<StrokeCell> const& Update(std::vector<MKStrokePoint> const& points);
 
+    // As at the start; keeps the memory.
+    void Clear();
+
 private:
     // Of points that are left out one after the other.
     static constexpr std::size_t kMostSkipped = 32;
