@@ -36,10 +36,9 @@ Notebook::Notebook(Options const& options, SDL_Window* window, RenderThread& que
                  [this] { Wake(); }},
                 static_cast<std::uint32_t>(options.autosave * 1000)),
       mImages(queue, [this] { Wake(); }),
-      mPainter(mDocument.GetPage(), mImages),
+      mPainter(mDocument.GetPage(), mImages, queue),
       mTools(mDocument.GetPage(), mPainter),
-      mTiles(queue, static_cast<std::size_t>(options.cache) << 20,
-             [this](IMKCanvas& canvas, RectF const& area) { return mPainter.Paint(canvas, area); }),
+      mTiles(queue, static_cast<std::size_t>(options.cache) << 20, mPainter),
       mInput(window, *this),
       mRecorder(options.record),
       mFrames(queue, options.statistics, [this] { Wake(); }) {
@@ -65,7 +64,11 @@ int Notebook::Run() {
     mDocument.Open(mOptions.page.empty() ? Document::GetLastPath() : mOptions.page);
     while (mIsRunning) {
         Work();
-        if (mIsRunning && mIsDirty && !mFrames.IsInFlight()) DrawFrame();
+        if (!mIsRunning || !mIsDirty || mFrames.IsInFlight()) continue;
+        // What came while the last frame was on its way, to the last moment, belongs to this one.
+        if (mReplay.IsActive()) mReplay.Pump(mWindow, false);
+        WaitForInput(0);
+        if (mIsRunning) DrawFrame();
     }
     mQueue.WaitForTasks();
     if (mOptions.statistics) {
@@ -131,8 +134,7 @@ void Notebook::PageHasChanged(Splice const& splice) {
     bool const isOnTop =
         splice.removed.empty() && splice.at + splice.inserted.size() == page.GetObjects().size();
     if (isOnTop)
-        for (ObjectPtr const& object : splice.inserted)
-            mTiles.Add(object->bounds, [&](IMKCanvas& canvas) { mPainter.Draw(canvas, *object); });
+        for (ObjectPtr const& object : splice.inserted) mTiles.Add(object);
     else
         mTiles.Invalidate(splice.GetBounds());
     MoveView();
@@ -161,7 +163,7 @@ void Notebook::DrawFrame() {
     Page const& page = mDocument.GetPage();
     IMKCanvas& canvas = *mScreen;
     canvas.ClearAll(static_cast<int>(kDesk));
-    bool const isDone = mTiles.Draw(canvas, mView, page.GetHeight(), IsZooming());
+    bool const isDone = mTiles.Draw(canvas, mView, page.GetHeight(), IsZooming(), mFrames.GetLast());
     canvas.Save(IMKCanvasBase::SaveAll);
     mView.Apply(canvas);
     mTools.Draw(canvas, mView.zoom, kAhead);

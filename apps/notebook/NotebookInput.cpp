@@ -25,7 +25,7 @@ void Notebook::PenDown(float x, float y, std::uint32_t time, float pressure) {
     mIsDirty = true;
     if (y < static_cast<float>(mView.top)) return Do(mToolbar.Press(x, mTools));
     mTools.Down(mView.ToPage(x, y), time, pressure, mView.zoom);
-    if (mTools.IsDragging()) mTiles.Invalidate(mView.GetPageArea());
+    if (mTools.IsDragging()) mTiles.Invalidate(mTools.GetSelectedBounds());
 }
 
 void Notebook::PenMove(float x, float y, std::uint32_t time, float pressure) {
@@ -36,14 +36,14 @@ void Notebook::PenMove(float x, float y, std::uint32_t time, float pressure) {
 void Notebook::PenUp() {
     bool const isDragging = mTools.IsDragging();
     mTools.Up();
-    if (isDragging) mTiles.Invalidate(mView.GetPageArea());
+    if (isDragging) mTiles.Invalidate(mTools.GetSelectedBounds());
     mIsDirty = true;
 }
 
 void Notebook::PenCancel() {
     bool const isDragging = mTools.IsDragging();
     mTools.Cancel();
-    if (isDragging) mTiles.Invalidate(mView.GetPageArea());
+    if (isDragging) mTiles.Invalidate(mTools.GetSelectedBounds());
     mIsDirty = true;
 }
 
@@ -224,7 +224,8 @@ void Notebook::Export(bool isPage, std::string const& path) {
     view.top = 0;
     if (isPage) view = Viewport{1, 0, 0, width, height, 0};
     view.Apply(*canvas);
-    mPainter.Paint(*canvas, view.GetPageArea());
+    canvas->ClearAll(static_cast<int>(kPaper));
+    for (ObjectPtr const& object : mPainter.Find(view.GetPageArea())) mPainter.Draw(*canvas, *object);
     mDocument.Run([bitmap, path]() -> PageStore::Report {
         std::string reason;
         if (!SaveBitmap(*bitmap, path, 90, &reason))
