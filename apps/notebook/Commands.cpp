@@ -12,8 +12,8 @@ namespace {
 
 namespace fs = std::filesystem;
 
-constexpr double kZoomStep = 1.25;
-constexpr float kDropSide = 480; // the longer side of an image that is put on the page
+constexpr int kEnd = 8 * Page::kMaxHeight; // farther than any page reaches at any zoom
+constexpr float kDropSide = 480;           // the longer side of an image that is put on the page
 
 struct Shortcut {
     SDL_Keycode key;
@@ -39,11 +39,11 @@ constexpr Shortcut kShortcuts[] = {
     {SDLK_DOWN, false, {Command::ScrollDown, 60}, {}},
     {SDLK_PAGEUP, false, {Command::ScrollPages, -9}, {}},
     {SDLK_PAGEDOWN, false, {Command::ScrollPages, 9}, {}},
-    {SDLK_HOME, false, {Command::ScrollToTop}, {}},
-    {SDLK_END, false, {Command::ScrollToEnd}, {}},
-    {SDLK_PLUS, false, {Command::ZoomIn}, {}},
-    {SDLK_EQUALS, false, {Command::ZoomIn}, {}},
-    {SDLK_MINUS, false, {Command::ZoomOut}, {}},
+    {SDLK_HOME, false, {Command::ScrollDown, -kEnd}, {}},
+    {SDLK_END, false, {Command::ScrollDown, kEnd}, {}},
+    {SDLK_PLUS, false, {Command::ZoomBy, 125}, {}},
+    {SDLK_EQUALS, false, {Command::ZoomBy, 125}, {}},
+    {SDLK_MINUS, false, {Command::ZoomBy, 80}, {}},
     {SDLK_0, false, {Command::ZoomOne}, {}},
     {SDLK_z, true, {Command::Undo}, {Command::Redo}},
     {SDLK_y, true, {Command::Redo}, {}},
@@ -105,6 +105,9 @@ void Notebook::EditPrompt(SDL_Keycode key) {
 }
 
 void Notebook::Do(Action const& action) {
+    auto const value = static_cast<float>(action.value);
+    auto const height = static_cast<float>(mView.height);
+    PointF const middle(static_cast<float>(mView.width) / 2, static_cast<float>(mView.top) + height / 2);
     mIsDirty = true;
     switch (action.command) {
     case Command::Choose:
@@ -112,7 +115,7 @@ void Notebook::Do(Action const& action) {
     case Command::SetColor:
         return mTools.SetColor(static_cast<unsigned>(action.value));
     case Command::SetWidth:
-        return mTools.SetWidth(static_cast<float>(action.value) / 10);
+        return mTools.SetWidth(value / 10);
     case Command::Delete:
         return mTools.DeleteSelected();
     case Command::Escape:
@@ -124,13 +127,22 @@ void Notebook::Do(Action const& action) {
         mTools.Select({});
         action.command == Command::Undo ? mDocument.GetPage().Undo() : mDocument.GetPage().Redo();
         return;
+    case Command::ZoomBy:
+        return Zoom(middle, action.value / 100.0);
+    case Command::ZoomOne:
+        return Zoom(middle, 1 / mView.zoom);
+    case Command::ScrollAcross:
+        return Pan(-value, 0);
+    case Command::ScrollDown:
+        return Pan(0, -value);
+    case Command::ScrollPages:
+        return Pan(0, -value * height / 10);
     default:
-        DoWithPage(action.command);
-        DoWithView(action);
+        return DoWithFiles(action.command);
     }
 }
 
-void Notebook::DoWithPage(Command command) {
+void Notebook::DoWithFiles(Command command) {
     fs::path const path = mDocument.GetPath();
     std::string const picture = fs::path(path).replace_extension("png").string();
     switch (command) {
@@ -149,33 +161,6 @@ void Notebook::DoWithPage(Command command) {
         return Paste();
     case Command::Quit:
         return Quit();
-    default:
-        return;
-    }
-}
-
-void Notebook::DoWithView(Action const& action) {
-    auto const value = static_cast<float>(action.value);
-    auto const height = static_cast<float>(mView.height);
-    PointF const middle(static_cast<float>(mView.width) / 2, static_cast<float>(mView.top) + height / 2);
-    auto const length = static_cast<float>(mView.Scale(Page::kMaxHeight));
-    switch (action.command) {
-    case Command::ZoomIn:
-        return Zoom(middle, kZoomStep);
-    case Command::ZoomOut:
-        return Zoom(middle, 1 / kZoomStep);
-    case Command::ZoomOne:
-        return Zoom(middle, 1 / mView.zoom);
-    case Command::ScrollAcross:
-        return Pan(-value, 0);
-    case Command::ScrollDown:
-        return Pan(0, -value);
-    case Command::ScrollPages:
-        return Pan(0, -value * height / 10);
-    case Command::ScrollToTop:
-        return Pan(0, length);
-    case Command::ScrollToEnd:
-        return Pan(0, -length);
     default:
         return;
     }

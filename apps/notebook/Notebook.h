@@ -52,8 +52,7 @@ private:
     void Key(SDL_Keycode key, bool isShift);
     void EditPrompt(SDL_Keycode key);
     void Do(Action const& action);
-    void DoWithPage(Command command);
-    void DoWithView(Action const& action);
+    void DoWithFiles(Command command);
     void Ask(Command command, char const* question, std::string const& proposal);
     void Answer();
     void Export(bool isPage, std::string const& path);

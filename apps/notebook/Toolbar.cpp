@@ -18,8 +18,8 @@ constexpr float kMiddle = Toolbar::kHeight / 2.0f;
 } // namespace
 
 Toolbar::Toolbar() {
-    auto const word = [this](Command command, char const* label) {
-        Add({command}, label, false, MeasureLetters(label, kLetter) + 16);
+    auto const word = [this](Action action, char const* label) {
+        Add(action, label, false, MeasureLetters(label, kLetter) + 16);
     };
     for (int tool = 0; tool < static_cast<int>(std::size(kToolIcons)); ++tool)
         Add({Command::Choose, tool}, kToolIcons[tool], true, 42);
@@ -31,13 +31,13 @@ Toolbar::Toolbar() {
     Add({Command::Undo}, kUndoIcon, true, 42);
     Add({Command::Redo}, kRedoIcon, true, 42);
     mEnd += kSpace;
-    word(Command::ZoomOut, "-");
-    word(Command::ZoomOne, "1:1");
-    word(Command::ZoomIn, "+");
+    word({Command::ZoomBy, 80}, "-");
+    word({Command::ZoomOne}, "1:1");
+    word({Command::ZoomBy, 125}, "+");
     mEnd += kSpace;
-    word(Command::Open, "Open");
-    word(Command::Save, "Save");
-    word(Command::ExportPage, "Export");
+    word({Command::Open}, "Open");
+    word({Command::Save}, "Save");
+    word({Command::ExportPage}, "Export");
 }
 
 void Toolbar::Add(Action action, char const* label, bool isIcon, float width) {

@@ -25,14 +25,11 @@ enum class Command {
     Delete,
     Escape,
     Quit,
-    ZoomIn,
-    ZoomOut,
+    ZoomBy, // so many hundredths
     ZoomOne,
     ScrollAcross, // by so many pixels
     ScrollDown,
-    ScrollPages, // by so many tenths of what is seen
-    ScrollToTop,
-    ScrollToEnd
+    ScrollPages // by so many tenths of what is seen
 };
 
 struct Action {
