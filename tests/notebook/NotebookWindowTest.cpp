@@ -13,6 +13,7 @@
 #include <filesystem>
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
+#include <regex>
 #include <thread>
 
 namespace Moka::Testing {
@@ -217,7 +218,6 @@ TEST_F(NotebookWindowTest, ShowsWhatItsFileDrawsAndOpensItAgain) {
     EXPECT_FALSE(GetPagePart(Grab()) == GetPagePart(scrolled)) << "zoomed in";
     Do("key 0 key Home");
     ExpectSame(GetPagePart(top), GetPagePart(Grab()), "zoomed back");
-    EXPECT_TRUE(SaveImage(top, "notebook-window.png"));
     Close(*process);
 
     process = Start({}); // the last page
@@ -299,9 +299,7 @@ TEST_F(NotebookWindowTest, ExportsPastesAndOpensWhatItIsTold) {
          {"cannot put ", "broken.png on the page", "cannot read the image", "no side above 16383",
           "the page has 66206 rows and an image at most 65535"})
         EXPECT_THAT(result.err, HasSubstr(told));
-    Picture const view = LoadImage(mFolder.Path("view.png"));
-    EXPECT_EQ(view.width, kWidth);
-    EXPECT_EQ(view.GetColor(300 + kEdge, 200), (Color{0, 0, 0, 255}));
+    EXPECT_EQ(LoadImage(mFolder.Path("view.png")).GetColor(300 + kEdge, 200), (Color{0, 0, 0, 255}));
     ExpectSame(Draw("page.json"), LoadImage(mFolder.Path("whole.png")), "exported");
     EXPECT_THAT(ReadFile(mFolder.Path("page-second.json")), HasSubstr("photo.png"));
     EXPECT_THAT(ReadFile(mFolder.Path("higher.json")), HasSubstr("]}}\n]}\n")) << "saved whole";
@@ -313,16 +311,9 @@ TEST_F(NotebookWindowTest, TheRenderThreadAllocatesNothingForInkOnceItIsWarm) {
     script.Add("quit");
     ProcessResult const result =
         Start({"page.json", "--statistics", "--replay", WriteScript(script)})->Wait();
-    std::string const head = "allocations on the render thread: ";
-    std::size_t const at = result.out.find(head);
-    ASSERT_NE(at, std::string::npos) << result.out;
-    unsigned long all = 0;
-    unsigned long warm = 0;
-    unsigned long frames = 0;
-    ASSERT_EQ(std::sscanf(result.out.c_str() + at + head.size(), "%lu in all, %lu in the last %lu", &all,
-                          &warm, &frames),
-              3);
-    EXPECT_LT(warm, frames) << "more than a vector that grows now and then";
+    std::smatch count;
+    ASSERT_TRUE(std::regex_search(result.out, count, std::regex("(\\d+) in the last (\\d+) frames")));
+    EXPECT_LT(std::stoi(count[1]), std::stoi(count[2])) << "more than a vector that grows now and then";
 }
 
 TEST_F(NotebookWindowTest, SaysWhatToDoWithoutAWindow) {

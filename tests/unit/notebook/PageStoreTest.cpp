@@ -153,12 +153,9 @@ TEST_F(NotebookStoreTest, APageThatWasNotReadWholeIsSavedUnderANewNameOnly) {
 
 // What is drawn and undone for hours does not fill the disk.
 TEST_F(NotebookStoreTest, AJournalIsWrittenAnewBeforeItIsMuchLongerThanThePage) {
-    {
-        auto const document = Open(mPath);
-        document->GetPage().Append(MakeDash(1, 1));
-        EXPECT_TRUE(document->Close());
-    }
     auto const document = Open(mPath);
+    document->GetPage().Append(MakeDash(1, 1));
+    document->Save(nullptr);
     document->GetPage().Append(MakeDash(2, 2));
     for (int i = 0; i < 7; ++i) { // 1 MB each
         document->GetPage().Append(MakeStroke(InkPoints(40'000, {10'000.25f, 10'000.25f, 10.25f})));
