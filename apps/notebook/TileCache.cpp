@@ -8,7 +8,7 @@ namespace Moka::Notebook {
 namespace {
 
 // What a frame draws, in points of strokes; an object counts kObject more.
-constexpr double kLeastBudget = 300;
+constexpr double kLeastBudget = 600;
 constexpr double kMostBudget = 200'000;
 constexpr double kObject = 20;
 constexpr int kAhead = 2 * TileCache::kSide; // of the window's pixels, drawn before they are seen

@@ -27,7 +27,7 @@ class TileCache {
 public:
     static constexpr int kSide = 256;
     static constexpr std::size_t kTileBytes = std::size_t{4} * kSide * kSide;
-    static constexpr double kFrameTime = 20; // milliseconds
+    static constexpr double kFrameTime = 25; // milliseconds
 
     TileCache(IGLMsgQueue& queue, std::size_t limitBytes, Painter const& painter)
         : mQueue(queue), mPainter(painter), mLimit(limitBytes / kTileBytes) {}
