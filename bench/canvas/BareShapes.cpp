@@ -114,6 +114,36 @@ flat in vec4 flatColor;
 out vec4 result;
 void main() { result = flatColor; }
 )";
+constexpr char kBatchCoverageVertex[] = R"(#version 300 es
+layout(location = 0) in vec2 position;
+layout(location = 1) in vec4 place; // u, v, coverage
+layout(location = 2) in vec4 color;
+out highp float coverage;
+out highp vec2 uv;
+flat out mediump vec4 flatColor;
+void main() {
+    coverage = place.z;
+    uv = place.xy;
+    flatColor = color;
+    gl_Position = vec4(position / 512.0 - 1.0, 0.0, 1.0);
+}
+)";
+constexpr char kBatchCoveredRectFragment[] = R"(#version 300 es
+precision mediump float;
+in highp float coverage;
+flat in vec4 flatColor;
+out vec4 result;
+void main() { result = flatColor * coverage; }
+)";
+constexpr char kBatchBitmapFragment[] = R"(#version 300 es
+precision mediump float;
+uniform sampler2D source;
+in highp float coverage;
+in highp vec2 uv;
+flat in vec4 flatColor;
+out vec4 result;
+void main() { result = texture(source, uv) * (flatColor.a * coverage); }
+)";
 constexpr char kBatchCircleFragment[] = R"(#version 300 es
 precision mediump float;
 in highp vec2 local;
@@ -204,6 +234,27 @@ void SetUniforms(BareProgram const& program, Vector4<float> const& color) {
     glUniform1i(program.Find("hasTint"), 0);
 }
 
+char const* GetBatchVertex(BareBatch::Shape shape) {
+    bool const isCovered = shape == BareBatch::Shape::CoveredRect || shape == BareBatch::Shape::Bitmap;
+    return isCovered ? kBatchCoverageVertex : kBatchVertex;
+}
+
+char const* GetBatchFragment(BareBatch::Shape shape) {
+    switch (shape) {
+    case BareBatch::Shape::Rect:
+        return kBatchRectFragment;
+    case BareBatch::Shape::CoveredRect:
+        return kBatchCoveredRectFragment;
+    case BareBatch::Shape::Bitmap:
+        return kBatchBitmapFragment;
+    case BareBatch::Shape::Circle:
+        return kBatchCircleFragment;
+    case BareBatch::Shape::Line:
+        break;
+    }
+    return kBatchLineFragment;
+}
+
 std::size_t CountFloats(std::size_t shapes, int floatsEach) {
     return shapes * kCorners * static_cast<std::size_t>(floatsEach);
 }
@@ -259,11 +310,8 @@ void BareQuads::Draw(std::vector<RectF> const& dsts) {
     glDrawArrays(GL_TRIANGLES, 0, mVertices.Count(mFloats));
 }
 
-BareBatch::BareBatch(Shape shape)
-    : mShape(shape),
-      mProgram(kBatchVertex, shape == Shape::Rect     ? kBatchRectFragment
-                             : shape == Shape::Circle ? kBatchCircleFragment
-                                                      : kBatchLineFragment) {}
+BareBatch::BareBatch(Shape shape, int size)
+    : mShape(shape), mSource(size, size), mProgram(GetBatchVertex(shape), GetBatchFragment(shape)) {}
 
 void BareBatch::Draw(int count, int size) {
     constexpr float kLineWidth = 4;
@@ -277,6 +325,8 @@ void BareBatch::Draw(int count, int size) {
         };
         if (mShape == Shape::Rect) {
             ForEachCorner(box, [&](float x, float y, float, float) { write(x, y, 0, 0, 0, 0); });
+        } else if (mShape == Shape::CoveredRect || mShape == Shape::Bitmap) {
+            ForEachCorner(box, [&](float x, float y, float u, float v) { write(x, y, u, v, 1, 0); });
         } else if (mShape == Shape::Circle) {
             float const half = side / 2;
             PointF const center(box.left + half, box.top + half);
@@ -299,6 +349,7 @@ void BareBatch::Draw(int count, int size) {
     mTarget.DrawInto();
     SetBareState();
     mProgram.Use();
+    mSource.Sample();
     mVertices.Upload(mFloats);
     glDrawArrays(GL_TRIANGLES, 0, mVertices.Count(mFloats));
 }

@@ -44,14 +44,16 @@ private:
 // Shapes of one kind and of distinct colours in one call. Each vertex has all that its shape's program needs.
 class BareBatch {
 public:
-    enum class Shape { Rect, Circle, Line };
+    // A covered rectangle has a coverage in each vertex, as the library's have.
+    enum class Shape { Rect, CoveredRect, Bitmap, Circle, Line };
 
-    explicit BareBatch(Shape shape);
+    BareBatch(Shape shape, int size);
     void Draw(int count, int size);
 
 private:
     Shape const mShape;
     BareImage mTarget{kSide, kSide};
+    BareImage mSource; // of bitmaps
     BareProgram mProgram;
     BareVertices mVertices{2, 4, 4};
     std::vector<float> mFloats;

@@ -159,7 +159,8 @@ void ManyRects(benchmark::State& state) {
 // The same shapes in one batch of bare GL, whose program is written for them alone.
 void BesideBatch(benchmark::State& state, BareBatch::Shape shape, int size) {
     BenchCanvas target;
-    OnRenderThread<BareBatch> bare(shape);
+    RefPtr<IMKBitmap> const bitmap = MakeBitmap(size, size);
+    OnRenderThread<BareBatch> bare(shape, size);
     MKPaint paint;
     paint.SetLineWidth(4);
     auto const half = static_cast<float>(size) / 2;
@@ -171,7 +172,11 @@ void BesideBatch(benchmark::State& state, BareBatch::Shape shape, int size) {
                 RectF const box = BoxOf(i, size);
                 switch (shape) {
                 case BareBatch::Shape::Rect:
+                case BareBatch::Shape::CoveredRect:
                     target.canvas->DrawRect(box, &paint);
+                    break;
+                case BareBatch::Shape::Bitmap:
+                    target.canvas->DrawBitmap(bitmap.Get(), box.left, box.top, &paint);
                     break;
                 case BareBatch::Shape::Circle:
                     target.canvas->DrawCircle(box.left + half, box.top + half, half, &paint);
@@ -203,6 +208,10 @@ BENCHMARK(PageOfStrokes)->Apply(Configure);
 BENCHMARK(ManyRects)->RangeMultiplier(10)->Range(1000, 1'000'000)->Apply(Configure);
 BENCHMARK_CAPTURE(BesideBatch, rect_16, BareBatch::Shape::Rect, 16)->Apply(Configure);
 BENCHMARK_CAPTURE(BesideBatch, rect_64, BareBatch::Shape::Rect, 64)->Apply(Configure);
+BENCHMARK_CAPTURE(BesideBatch, covered_rect_16, BareBatch::Shape::CoveredRect, 16)->Apply(Configure);
+BENCHMARK_CAPTURE(BesideBatch, covered_rect_64, BareBatch::Shape::CoveredRect, 64)->Apply(Configure);
+BENCHMARK_CAPTURE(BesideBatch, bitmap_16, BareBatch::Shape::Bitmap, 16)->Apply(Configure);
+BENCHMARK_CAPTURE(BesideBatch, bitmap_64, BareBatch::Shape::Bitmap, 64)->Apply(Configure);
 BENCHMARK_CAPTURE(BesideBatch, circle_16, BareBatch::Shape::Circle, 16)->Apply(Configure);
 BENCHMARK_CAPTURE(BesideBatch, circle_64, BareBatch::Shape::Circle, 64)->Apply(Configure);
 BENCHMARK_CAPTURE(BesideBatch, line_16, BareBatch::Shape::Line, 16)->Apply(Configure);

@@ -77,31 +77,39 @@ MKCanvasImpl::~MKCanvasImpl() {
 //     for (Touched frame(*this, shape, m); frame.Next();) drawable->DrawRT(..., frame.GetProjection(), paint);
 class MKCanvasImpl::Touched {
 public:
-    Touched(MKCanvasImpl const& canvas, RectF const& shape, Matrix3<float> const& m)
-        : mClipping(canvas.GetClipping()), mShape(shape), mMatrix(m), mFrame(canvas.GetBitmap()) {}
+    Touched(MKCanvasImpl& canvas, RectF const& shape, Matrix3<float> const& m)
+        : mCanvas(canvas), mShape(shape), mMatrix(m), mFrame(canvas.GetBitmap()) {}
 
     bool Next() {
         mDrawing.reset();
         while (mFrame.Next()) {
             if (!Touches(mFrame.bounds, mShape, mMatrix)) continue;
-            mDrawing.emplace(mClipping, mFrame.writable, mFrame.index);
+            mDrawing.emplace(mCanvas.GetClipping(), mFrame.writable, mFrame.index);
             return true;
         }
         return false;
     }
 
     RectF const& Bounds() const { return mFrame.bounds; }
-    Matrix4<float> GetProjection() const {
-        return mFrame.writable->GetProjectionMatrix() * FromMatrix3(mMatrix);
-    }
+    Matrix4<float> const& GetProjection() const { return mCanvas.Project(*mFrame.writable, mMatrix); }
 
 private:
-    MKCanvasClipping* const mClipping;
+    MKCanvasImpl& mCanvas;
     RectF const mShape;
     Matrix3<float> const& mMatrix;
     FrameBuffers mFrame;
     std::optional<Drawing> mDrawing;
 };
+
+Matrix4<float> const& MKCanvasImpl::Project(IMKBitmapWritable& target, Matrix3<float> const& model) {
+    Matrix4<float> const projection = target.GetProjectionMatrix();
+    if (!(mLast.target == projection) || !(mLast.model == model)) {
+        mLast.target = projection;
+        mLast.model = model;
+        mLast.product = projection * FromMatrix3(model);
+    }
+    return mLast.product;
+}
 
 void MKCanvasImpl::DrawRT(IMKCustomDrawable* drawable, Matrix3<float> const& m, MKPaint const& paint) {
     Trace::NameTask("DrawRT");

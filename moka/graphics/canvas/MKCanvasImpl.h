@@ -54,12 +54,23 @@ public:
 private:
     class Touched;
 
+    // The product of the matrices of the last draw: neighbours mostly share both.
+    struct Projection {
+        Matrix4<float> target;
+        Matrix3<float> model;
+        Matrix4<float> product;
+    };
+
+    // From pixels before the model matrix to the target. Valid until the next call.
+    Matrix4<float> const& Project(IMKBitmapWritable& target, Matrix3<float> const& model);
+
     void DrawWhole(IMKBitmap* src, RectF const& srcRect, RectF const& dstRect, Matrix3<float> const& m,
                    MKPaint const& paint);
     void DrawInPieces(IMKBitmap* src, RectF const& srcRect, RectF const& dstRect, Matrix3<float> const& m,
                       MKPaint const& paint);
 
     IGLMsgQueue* const mQueue; // not owned
+    Projection mLast;
     std::unique_ptr<MKLineDrawable> mLineDrawable;
     std::unique_ptr<MKRectDrawable> mRectDrawable;
     std::unique_ptr<MKRoundRectDrawable> mRoundRectDrawable;

@@ -29,6 +29,7 @@ MKCanvasImplBase::Target::~Target() {
 MKCanvasImplBase::FrameBuffers::FrameBuffers(IMKBitmap* target)
     : mTarget(target),
       mStrips(target->GetTextureBitmap()),
+      mStripCount(mStrips ? mStrips->GetSubBitmapCount() : 0),
       mAttachable(target->GetBitmapCanvasAttachable()) {}
 
 bool MKCanvasImplBase::FrameBuffers::Next() {
@@ -39,7 +40,7 @@ bool MKCanvasImplBase::FrameBuffers::Next() {
         bounds = RectF(mTarget->GetBitmapRect());
         return true;
     }
-    while (++index < mStrips->GetSubBitmapCount()) {
+    while (++index < mStripCount) {
         IMKSubBitmap* const strip = mStrips->GetSubBitmap(index);
         if (!strip || (mAttachable && !mAttachable->HasFrameBufferRT(index))) continue;
         writable = strip;

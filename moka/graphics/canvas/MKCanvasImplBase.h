@@ -50,6 +50,7 @@ protected:
     private:
         IMKBitmap* const mTarget;
         IMKTextureBitmap* const mStrips; // null for a target that is one frame buffer
+        int const mStripCount;
         IMKBitmapCanvasAttachable* const mAttachable;
         bool mIsDone = false; // with the one frame buffer
     };

@@ -1,6 +1,7 @@
 #include "moka/graphics/math/Matrix3.h"
 
 #include "moka/base/Rect.h"
+#include "moka/base/SameBits.h"
 #include "moka/graphics/math/SinCos.h"
 
 #include <algorithm>
@@ -42,7 +43,30 @@ void Adjugate(T const* m, T (&a)[9]) {
 }
 
 template <class T>
-RectF MapCorners(T const* m, T left, T top, T right, T bottom) {
+bool IsScaleAndTranslation(T const* m) {
+    return m[1] == 0 && m[2] == 0 && m[3] == 0 && m[5] == 0 && m[8] == 1;
+}
+
+// Infinity and what is not a number differ from themselves here.
+template <class T>
+bool AreFinite(T a, T b, T c, T d) {
+    return (a - a) + (b - b) + (c - c) + (d - d) == 0;
+}
+
+template <class T>
+void MapCorners(T const* m, T left, T top, T right, T bottom, RectF& box) {
+    // The zeros of such a matrix take no part, unless they meet infinity.
+    if (IsScaleAndTranslation(m) && AreFinite(left, top, right, bottom)) {
+        T const x0 = m[0] * left + m[6];
+        T const x1 = m[0] * right + m[6];
+        T const y0 = m[4] * top + m[7];
+        T const y1 = m[4] * bottom + m[7];
+        box.left = std::min(x0, x1);
+        box.right = std::max(x0, x1);
+        box.top = std::min(y0, y1);
+        box.bottom = std::max(y0, y1);
+        return;
+    }
     T const xs[] = {left, right, right, left};
     T const ys[] = {top, bottom, top, bottom};
     T mappedX[4];
@@ -58,14 +82,13 @@ RectF MapCorners(T const* m, T left, T top, T right, T bottom) {
         for (int i = 0; i < 4; ++i) mappedY[i] /= w[i];
     }
     // Only a first corner that is not a number leaves its trace.
-    RectF box(mappedX[0], mappedY[0], mappedX[0], mappedY[0]);
+    box = RectF(mappedX[0], mappedY[0], mappedX[0], mappedY[0]);
     for (int i = 1; i < 4; ++i) {
         box.left = mappedX[i] < box.left ? mappedX[i] : box.left;
         box.right = mappedX[i] > box.right ? mappedX[i] : box.right;
         box.top = mappedY[i] < box.top ? mappedY[i] : box.top;
         box.bottom = mappedY[i] > box.bottom ? mappedY[i] : box.bottom;
     }
-    return box;
 }
 
 } // namespace
@@ -82,8 +105,9 @@ Matrix3<T>::Matrix3(T const* elements) {
 
 template <class T>
 bool Matrix3<T>::operator==(Matrix3 const& other) const {
-    // NOLINTNEXTLINE(bugprone-suspicious-memory-comparison): by bits, as declared
-    return std::memcmp(mElements, other.mElements, sizeof(mElements)) == 0;
+    constexpr std::size_t kLast = 8;
+    return detail::HasSameBits<kLast * sizeof(T)>(mElements, other.mElements) &&
+           std::memcmp(mElements + kLast, other.mElements + kLast, sizeof(T)) == 0;
 }
 
 template <class T>
@@ -289,15 +313,17 @@ Matrix3<T> Matrix3<T>::transpose() const {
 
 template <class T>
 void Matrix3<T>::mapRect(Rect* result, Rect const& source) const {
-    RectF box = MapCorners(mElements, static_cast<T>(source.left), static_cast<T>(source.top),
-                           static_cast<T>(source.right), static_cast<T>(source.bottom));
+    RectF box;
+    MapCorners(mElements, static_cast<T>(source.left), static_cast<T>(source.top),
+               static_cast<T>(source.right), static_cast<T>(source.bottom), box);
     box.ExtendRect();
     *result = box;
 }
 
 template <class T>
 void Matrix3<T>::mapRect(RectF* result, RectF const& source) const {
-    *result = MapCorners(mElements, source.left, source.top, source.right, source.bottom);
+    RectF const from = source; // which result may be
+    MapCorners(mElements, from.left, from.top, from.right, from.bottom, *result);
 }
 
 template class Matrix3<float>;

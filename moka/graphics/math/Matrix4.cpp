@@ -1,5 +1,6 @@
 #include "moka/graphics/math/Matrix4.h"
 
+#include "moka/base/SameBits.h"
 #include "moka/graphics/math/SinCos.h"
 
 #include <algorithm>
@@ -58,8 +59,7 @@ Matrix4<T>::Matrix4(T const* elements) {
 
 template <class T>
 bool Matrix4<T>::operator==(Matrix4 const& other) const {
-    // NOLINTNEXTLINE(bugprone-suspicious-memory-comparison): by bits, as declared
-    return std::memcmp(mElements, other.mElements, sizeof(mElements)) == 0;
+    return detail::HasSameBits<sizeof(mElements)>(mElements, other.mElements);
 }
 
 template <class T>

@@ -3,6 +3,7 @@
 #pragma once
 
 #include "moka/renderer/device/RunState.h"
+#include "moka/renderer/device/VertexBuffer.h"
 
 #include <cstdint>
 #include <variant>
@@ -83,7 +84,7 @@ struct DrawList {
     std::vector<RunState> states;
     std::vector<Record> records;
     std::vector<unsigned char> uniforms;
-    std::vector<float> vertices;
+    VertexBuffer vertices;
 };
 
 } // namespace Moka::detail

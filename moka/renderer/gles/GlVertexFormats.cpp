@@ -18,7 +18,7 @@ int GlVertexFormats::Find(VertexDescriptor const& descriptor) {
 }
 
 // A whole new store each time, so that the driver need not wait for the draws that read the old one.
-void GlVertexFormats::Upload(std::vector<GLfloat> const& vertices) {
+void GlVertexFormats::Upload(VertexBuffer const& vertices) {
     if (mBuffer == 0) {
         Gl::GenBuffers(1, &mBuffer);
         ++mState.counters.buffers;

@@ -4,6 +4,7 @@
 #pragma once
 
 #include "moka/renderer/VertexDescriptor.h"
+#include "moka/renderer/device/VertexBuffer.h"
 #include "moka/renderer/gles/GlFunctions.h"
 
 #include <vector>
@@ -20,7 +21,7 @@ public:
     int Find(VertexDescriptor const& descriptor);
 
     // Within an operation: replaces the buffer's contents.
-    void Upload(std::vector<GLfloat> const& vertices);
+    void Upload(VertexBuffer const& vertices);
     // Within an operation: draws read the buffer in this layout.
     void Bind(int format);
     // The same, with vertex 0 of a draw at vertex first of the buffer, and a number for each vertex at

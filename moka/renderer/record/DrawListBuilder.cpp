@@ -23,17 +23,36 @@ std::uint32_t FindVarying(unsigned char const* a, unsigned char const* b, Progra
 
 } // namespace
 
-ListVertices DrawListBuilder::AddVertices(float const* vertices, int count, int stride,
-                                          ListVertices const& previous) {
-    std::vector<float>& floats = mList.vertices;
-    if (IsUndrawnEnd(previous)) floats.resize(previous.offset);
+void DrawListBuilder::AddVertices(float const* vertices, int count, int stride, ListVertices& place) {
+    VertexBuffer& floats = mList.vertices;
+    DropVertices(place);
     auto const step = static_cast<std::size_t>(stride);
-    std::size_t const offset = (floats.size() + step - 1) / step * step;
+    if (mEndStride != step) Align(step);
     std::size_t const size = static_cast<std::size_t>(count) * step;
-    // Draws of one format leave no gap.
-    if (floats.size() < offset) floats.resize(offset);
-    floats.insert(floats.end(), vertices, vertices + size);
-    return {mNumber, offset, size, step};
+    std::size_t const offset = floats.size();
+    floats.Append(vertices, size);
+    place.list = mNumber;
+    place.offset = offset;
+    place.size = size;
+    place.stride = step;
+    place.first = mEndVertex;
+    mEndVertex += count;
+}
+
+// Draws of one format leave no gap.
+void DrawListBuilder::Align(std::size_t stride) {
+    VertexBuffer& floats = mList.vertices;
+    std::size_t const end = (floats.size() + stride - 1) / stride;
+    floats.resize(end * stride);
+    mEndStride = stride;
+    mEndVertex = static_cast<int>(end);
+}
+
+void DrawListBuilder::DropVertices(ListVertices const& vertices) {
+    if (!IsUndrawnEnd(vertices)) return;
+    mList.vertices.resize(vertices.offset);
+    mEndStride = vertices.stride;
+    mEndVertex = vertices.first;
 }
 
 bool DrawListBuilder::IsUndrawnEnd(ListVertices const& vertices) const {
@@ -44,8 +63,11 @@ bool DrawListBuilder::IsUndrawnEnd(ListVertices const& vertices) const {
 void DrawListBuilder::AddDraw(RunState const& state, bool isKnownSame, ProgramState& program,
                               ListDraw const& draw) {
     ListVertices const& vertices = draw.vertices;
-    std::size_t const stateIndex = AddState(state, isKnownSame);
-    Record const record{AddValues(program), static_cast<int>(vertices.offset / vertices.stride) + draw.first,
+    bool const isLast = isKnownSame && mLastState != kNoState;
+    std::size_t const stateIndex = isLast ? mLastState : AddState(state);
+    ProgramState::Listed const& listed = program.listed;
+    bool const isListed = listed.list == mNumber && !listed.isStale;
+    Record const record{isListed ? listed.offset : AddValues(program), vertices.first + draw.first,
                         draw.count};
     OpenRun* const run = FindRun(stateIndex, draw.bounds);
     Continuation how;
@@ -59,14 +81,13 @@ void DrawListBuilder::AddDraw(RunState const& state, bool isKnownSame, ProgramSt
 }
 
 void DrawListBuilder::AddSeparateDraw(SeparateDraw const& draw) {
-    ListVertices const vertices = AddVertices(draw.vertices, draw.count, draw.stride, {});
+    ListVertices vertices;
+    AddVertices(draw.vertices, draw.count, draw.stride, vertices);
     std::size_t const values = mList.uniforms.size();
     mList.uniforms.insert(mList.uniforms.end(), draw.values, draw.values + draw.valueBytes);
     UseTexture(draw.state.target.texture);
     mList.states.push_back(draw.state);
-    OpenNewRun(mList.states.size() - 1,
-               {values, static_cast<int>(vertices.offset / vertices.stride), draw.count}, {},
-               vertices.stride);
+    OpenNewRun(mList.states.size() - 1, {values, vertices.first, draw.count}, {}, vertices.stride);
     mDrawnFloats = vertices.offset + vertices.size;
 }
 
@@ -78,9 +99,8 @@ void DrawListBuilder::SetScissor(std::size_t command, ScissorState const& scisso
     }
 }
 
-std::size_t DrawListBuilder::AddState(RunState const& state, bool isKnownSame) {
+std::size_t DrawListBuilder::AddState(RunState const& state) {
     std::vector<RunState>& states = mList.states;
-    if (isKnownSame && mLastState != kNoState) return mLastState;
     std::size_t const reach = std::min(states.size(), kReach);
     auto const found =
         std::find(states.rbegin(), states.rbegin() + static_cast<std::ptrdiff_t>(reach), state);
@@ -97,7 +117,6 @@ std::size_t DrawListBuilder::AddState(RunState const& state, bool isKnownSame) {
 
 std::size_t DrawListBuilder::AddValues(ProgramState& program) {
     ProgramState::Listed& listed = program.listed;
-    if (listed.list == mNumber && !listed.isStale) return listed.offset;
     std::vector<unsigned char> const& values = program.GetValues();
     listed.offset = mList.uniforms.size();
     mList.uniforms.insert(mList.uniforms.end(), values.begin(), values.end());
@@ -109,8 +128,12 @@ std::size_t DrawListBuilder::AddValues(ProgramState& program) {
 DrawListBuilder::OpenRun* DrawListBuilder::FindRun(std::size_t state, DrawBounds const& bounds) {
     // Joined strips would be connected by triangles that nobody asked for.
     if (mList.states[state].primitive != PrimitiveType::TriangleList) return nullptr;
-    std::size_t const reach = mMerges ? kReach : 1;
-    for (std::size_t i = mRunCount; i > mFirstOpenRun && mRunCount - i < reach; --i) {
+    if (mRunCount > mFirstOpenRun && mRuns[mRunCount - 1].state == state) return &mRuns[mRunCount - 1];
+    return mMerges ? FindEarlierRun(state, bounds) : nullptr;
+}
+
+DrawListBuilder::OpenRun* DrawListBuilder::FindEarlierRun(std::size_t state, DrawBounds const& bounds) {
+    for (std::size_t i = mRunCount; i > mFirstOpenRun && mRunCount - i < kReach; --i) {
         OpenRun& run = mRuns[i - 1];
         if (run.state == state) return &run;
         // Another target's texture may be sampled by what lies between.
@@ -225,7 +248,7 @@ void DrawListBuilder::FinishRun(OpenRun const& run) {
 
 // The run's vertices are copied behind all others, in the order of its records.
 void DrawListBuilder::Gather(OpenRun const& run, Run& finished) {
-    std::vector<float>& floats = mList.vertices;
+    VertexBuffer& floats = mList.vertices;
     std::size_t const begin = (floats.size() + run.stride - 1) / run.stride * run.stride;
     try {
         floats.resize(begin + static_cast<std::size_t>(run.vertices) * run.stride);
@@ -235,9 +258,9 @@ void DrawListBuilder::Gather(OpenRun const& run, Run& finished) {
     int first = static_cast<int>(begin / run.stride);
     for (std::size_t i = 0; i < finished.recordCount; ++i) {
         Record& record = mList.records[finished.firstRecord + i];
-        auto const from = floats.begin() + record.first * static_cast<std::ptrdiff_t>(run.stride);
-        std::copy_n(from, static_cast<std::size_t>(record.count) * run.stride,
-                    floats.begin() + first * static_cast<std::ptrdiff_t>(run.stride));
+        auto const stride = static_cast<std::ptrdiff_t>(run.stride);
+        std::copy_n(floats.data() + record.first * stride, record.count * stride,
+                    floats.data() + first * stride);
         record.first = first;
         first += record.count;
     }
@@ -280,6 +303,8 @@ void DrawListBuilder::Clear(bool full) {
     mFirstOpenRun = 0;
     mLastState = kNoState;
     mDrawnFloats = 0;
+    mEndStride = 0;
+    mEndVertex = 0;
     mListedFloats = 0;
     mFlushReason = full ? RunEnd::Full : RunEnd::Other;
     ++mNumber;

@@ -26,6 +26,7 @@ struct ListVertices {
     std::size_t offset = 0; // floats
     std::size_t size = 0;   // floats
     std::size_t stride = 0; // floats of one vertex
+    int first = 0;          // offset in vertices
 };
 
 // Vertices to draw: count of them, from the first one on.
@@ -52,9 +53,9 @@ public:
     // Each draw is a run of its own, except where neither state nor values differ.
     void SetMerging(bool on) { mMerges = on; }
 
-    // Places the vertices at a multiple of their stride (floats of one vertex). previous are those that they
-    // take the place of: at the end of the list and not drawn, they are dropped.
-    ListVertices AddVertices(float const* vertices, int count, int stride, ListVertices const& previous);
+    // Places the vertices at a multiple of their stride (floats of one vertex). place says where; those that it
+    // named before are dropped if they lie at the end of the list and are not drawn.
+    void AddVertices(float const* vertices, int count, int stride, ListVertices& place);
     bool Has(ListVertices const& vertices) const { return vertices.list == mNumber; }
     float const* GetVertices(ListVertices const& vertices) const {
         return mList.vertices.data() + vertices.offset;
@@ -76,9 +77,7 @@ public:
     }
 
     // Drops vertices that nobody draws if they are the last ones.
-    void DropVertices(ListVertices const& vertices) {
-        if (IsUndrawnEnd(vertices)) mList.vertices.resize(vertices.offset);
-    }
+    void DropVertices(ListVertices const& vertices);
 
     // Numbers the lists from 1 on.
     std::uint64_t GetNumber() const { return mNumber; }
@@ -142,9 +141,11 @@ private:
     };
 
     bool IsUndrawnEnd(ListVertices const& vertices) const;
-    std::size_t AddState(RunState const& state, bool isKnownSame);
+    void Align(std::size_t stride);
+    std::size_t AddState(RunState const& state);
     std::size_t AddValues(ProgramState& program);
     OpenRun* FindRun(std::size_t state, DrawBounds const& bounds);
+    OpenRun* FindEarlierRun(std::size_t state, DrawBounds const& bounds);
     bool MayTouch(OpenRun& run, DrawBounds const& bounds);
     // False: the record needs a run of its own.
     bool Continues(OpenRun const& run, ProgramLayout const& layout, Record const& record,
@@ -179,6 +180,8 @@ private:
     RunEnd mFlushReason = RunEnd::Other; // why the list before this one ended
     std::size_t mLastState = kNoState;   // of this list's last draw that was no separate one
     std::size_t mDrawnFloats = 0;        // draws refer to vertices before it
+    std::size_t mEndStride = 0;          // the list's floats are a multiple of it: mEndVertex times
+    int mEndVertex = 0;
     // Of all draws: vertices that are drawn again may have to be copied.
     std::size_t mListedFloats = 0;
     // So that marks of earlier lists mean nothing in this one.

@@ -29,7 +29,8 @@ void Fill::Add(Recorder& recorder, TargetRef const& target, std::array<float, 4>
     state.format = mFormat;
     state.primitive = PrimitiveType::TriangleStrip;
     recorder.BeforeDraw(state, {});
-    ListVertices const corners = recorder.list.AddVertices(kCorners, 4, 2, {});
+    ListVertices corners;
+    recorder.list.AddVertices(kCorners, 4, 2, corners);
     recorder.list.AddDraw(state, false, *mProgram, {corners, 0, 4, {}});
     recorder.requested->SetChanged(true);
 }

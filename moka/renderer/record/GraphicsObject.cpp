@@ -46,7 +46,7 @@ void GraphicsObject::HandOver(float const* data, int count) {
     DrawListBuilder& list = mRecorder->list;
     // Vertices that nobody draws do not pile up.
     if (list.IsFull()) mRecorder->Flush();
-    mPlace = list.AddVertices(data, count, mFloatsPerVertex, mPlace);
+    list.AddVertices(data, count, mFloatsPerVertex, mPlace);
     if (mHeldList != mPlace.list) mRecorder->AddHolder(*this);
     mHeldList = mPlace.list;
     mCount = count;
@@ -93,7 +93,7 @@ float const* GraphicsObject::GetVertices() const {
 
 ListVertices const& GraphicsObject::PlaceVertices() {
     if (!mRecorder->list.Has(mPlace)) {
-        mPlace = mRecorder->list.AddVertices(mKept.data(), mCount, mFloatsPerVertex, {});
+        mRecorder->list.AddVertices(mKept.data(), mCount, mFloatsPerVertex, mPlace);
     }
     return mPlace;
 }

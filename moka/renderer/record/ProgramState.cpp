@@ -80,52 +80,26 @@ ProgramLayout::Uniform const* ProgramState::Find(ProgramLayout const& layout, st
 
 BindingType ProgramState::GetType(std::size_t handle) const { return mHandles[handle].type; }
 
-namespace {
-
-// Whether the value was another one. In line: twice as fast as memcmp.
-template <class Word, std::size_t kWords = 1>
-bool Replace(unsigned char* kept, void const* value) {
-    Word before[kWords];
-    Word now[kWords];
-    std::memcpy(before, kept, sizeof before);
-    std::memcpy(now, value, sizeof now);
-    Word difference = 0;
-    for (std::size_t i = 0; i < kWords; ++i) difference |= before[i] ^ now[i];
-    if (difference == 0) return false;
-    std::memcpy(kept, now, sizeof now);
-    return true;
-}
-
-bool Replace(unsigned char* kept, void const* value, BindingType type) {
-    switch (type) {
+bool ProgramState::Set(std::size_t handle, void const* value) {
+    switch (GetType(handle)) {
+    case BindingTypeBool:
+        return SetAs<BindingTypeBool>(handle, value);
     case BindingTypeMatrix4:
-        return Replace<std::uint64_t, 8>(kept, value);
-    case BindingTypeVector4:
-        return Replace<std::uint64_t, 2>(kept, value);
+        return SetAs<BindingTypeMatrix4>(handle, value);
     case BindingTypeVector2:
-        return Replace<std::uint64_t>(kept, value);
+        return SetAs<BindingTypeVector2>(handle, value);
+    case BindingTypeVector4:
+        return SetAs<BindingTypeVector4>(handle, value);
     case BindingTypeFloat:
+        return SetAs<BindingTypeFloat>(handle, value);
     case BindingTypeInt:
+        return SetAs<BindingTypeInt>(handle, value);
     case BindingTypeTextureUnit:
-        return Replace<std::uint32_t>(kept, value);
-    case BindingTypeBool: {
-        // Callers hand over a bool, of which only one byte is there to be read.
-        std::int32_t const flag = *static_cast<bool const*>(value) ? 1 : 0;
-        return Replace<std::uint32_t>(kept, &flag);
-    }
+        return SetAs<BindingTypeTextureUnit>(handle, value);
     case BindingTypeUnknown:
         break;
     }
     return false;
-}
-
-} // namespace
-
-bool ProgramState::Set(std::size_t handle, void const* value) {
-    Handle const& place = mHandles[handle];
-    if (mIsReleased || !Replace(mValues.data() + place.offset, value, place.type)) return false;
-    listed.isStale = true;
-    return true;
 }
 
 int ProgramState::GetSamplerUnit(std::size_t sampler) const {

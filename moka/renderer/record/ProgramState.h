@@ -7,6 +7,7 @@
 #pragma once
 
 #include "moka/renderer/device/ProgramLayout.h"
+#include "moka/renderer/record/UniformValue.h"
 
 #include <cstdint>
 #include <memory>
@@ -34,6 +35,15 @@ public:
     char const* GetHandleName(std::size_t handle) const { return mHandles[handle].name.c_str(); }
     // Whether the program's values changed.
     bool Set(std::size_t handle, void const* value);
+    // The same for a handle of that type; one that has another type now is left alone.
+    template <BindingType kType>
+    bool SetAs(std::size_t handle, void const* value) {
+        Handle const& place = mHandles[handle];
+        if (mIsReleased || place.type != kType) return false;
+        if (!ReplaceValue<kType>(mValues.data() + place.offset, value)) return false;
+        listed.isStale = true;
+        return true;
+    }
 
     bool CanDraw() const { return mName != 0 && mLayout.draws; }
     DeviceName GetName() const { return mName; }

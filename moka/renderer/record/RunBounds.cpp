@@ -1,6 +1,5 @@
 #include "moka/renderer/record/RunBounds.h"
 
-#include <algorithm>
 #include <new>
 
 namespace Moka::detail {
@@ -11,12 +10,6 @@ bool Touch(DrawBounds const& a, DrawBounds const& b) {
 }
 
 } // namespace
-
-DrawBounds Enclose(DrawBounds const& a, DrawBounds const& b) {
-    if (!a.IsKnown() || !b.IsKnown()) return {};
-    return {std::min(a.left, b.left), std::min(a.bottom, b.bottom), std::max(a.right, b.right),
-            std::max(a.top, b.top)};
-}
 
 void RunBounds::Clear() {
     mIsKnown = true;

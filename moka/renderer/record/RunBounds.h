@@ -7,12 +7,17 @@
 
 #include "moka/renderer/DrawBounds.h"
 
+#include <algorithm>
 #include <vector>
 
 namespace Moka::detail {
 
 // Unknown if one of them is.
-DrawBounds Enclose(DrawBounds const& a, DrawBounds const& b);
+inline DrawBounds Enclose(DrawBounds const& a, DrawBounds const& b) {
+    if (!a.IsKnown() || !b.IsKnown()) return {};
+    return {std::min(a.left, b.left), std::min(a.bottom, b.bottom), std::max(a.right, b.right),
+            std::max(a.top, b.top)};
+}
 
 class RunBounds {
 public:

@@ -20,39 +20,81 @@ void CommitProgram(Recorder& recorder, ProgramState const& program) {
     });
 }
 
-class Parameter final : public IParameterBinding {
+class ParameterBase : public IParameterBinding {
 public:
-    Parameter(std::shared_ptr<ProgramState> program, void const* object, std::size_t handle)
+    ParameterBase(std::shared_ptr<ProgramState> program, void const* object, std::size_t handle)
         : IParameterBinding(program->GetType(handle)),
           mProgram(std::move(program)),
           mObject(object),
           mHandle(handle) {}
-    ~Parameter() override {
+    ~ParameterBase() override {
         Observe(kProgramKind, mObject, "ReleaseParameter", mProgram->GetHandleName(mHandle));
     }
 
-    void Set(void const* value) override {
+protected:
+    void ObserveValue(void const* value) const {
         if (theObserver) {
             theObserver->OnValue(mObject, mProgram->GetHandleName(mHandle), GetType(), value);
         }
-        if (!mProgram->Set(mHandle, value)) return;
-        Recorder* const recorder = mProgram->GetRecorder();
-        if (recorder && recorder->IsThrough()) CommitValues(*recorder);
     }
 
-private:
-    // Values of a program that is not the current one wait until it is. Outside of a target the host may have
-    // made a program of its own current.
-    void CommitValues(Recorder& recorder) {
-        bool const isCurrent =
-            recorder.IsAttached() && recorder.GetActive() && recorder.requested->GetProgram() == mProgram;
-        if (isCurrent && recorder.Begin()) CommitProgram(recorder, *mProgram);
+    void CommitIfThrough() const {
+        Recorder* const recorder = mProgram->GetRecorder();
+        if (recorder && recorder->IsThrough()) CommitValues(*recorder);
     }
 
     std::shared_ptr<ProgramState> const mProgram;
     void const* const mObject; // names the program to the observer, not used otherwise
     std::size_t const mHandle;
+
+private:
+    // Values of a program that is not the current one wait until it is. Outside of a target the host may have
+    // made a program of its own current.
+    void CommitValues(Recorder& recorder) const {
+        bool const isCurrent =
+            recorder.IsAttached() && recorder.GetActive() && recorder.requested->GetProgram() == mProgram;
+        if (isCurrent && recorder.Begin()) CommitProgram(recorder, *mProgram);
+    }
 };
+
+// Most draws set parameters of these types, each several: no switch on the way.
+template <BindingType kType>
+class Parameter final : public ParameterBase {
+public:
+    using ParameterBase::ParameterBase;
+    void Set(void const* value) override {
+        ObserveValue(value);
+        if (mProgram->SetAs<kType>(mHandle, value)) CommitIfThrough();
+    }
+};
+
+// Of any other type, or of one that is not known before the program is built.
+class AnyParameter final : public ParameterBase {
+public:
+    using ParameterBase::ParameterBase;
+    void Set(void const* value) override {
+        ObserveValue(value);
+        if (mProgram->Set(mHandle, value)) CommitIfThrough();
+    }
+};
+
+IParameterBinding* MakeParameter(std::shared_ptr<ProgramState> const& program, void const* object,
+                                 std::size_t handle) {
+    switch (program->GetType(handle)) {
+    case BindingTypeMatrix4:
+        return new Parameter<BindingTypeMatrix4>(program, object, handle);
+    case BindingTypeVector2:
+        return new Parameter<BindingTypeVector2>(program, object, handle);
+    case BindingTypeVector4:
+        return new Parameter<BindingTypeVector4>(program, object, handle);
+    case BindingTypeFloat:
+        return new Parameter<BindingTypeFloat>(program, object, handle);
+    case BindingTypeInt:
+        return new Parameter<BindingTypeInt>(program, object, handle);
+    default:
+        return new AnyParameter(program, object, handle);
+    }
+}
 
 // A parameter of no program. It has no state, so all of them share one place in memory, and handing one out
 // cannot fail.
@@ -114,7 +156,8 @@ void ShaderProgram::Release() {
 IParameterBinding* ShaderProgram::GetParameter(char const* name) {
     IShaderProgram* const self = this;
     try {
-        auto* const parameter = new Parameter(mState, self, mState->AddHandle(name));
+        std::size_t const handle = mState->AddHandle(name);
+        IParameterBinding* const parameter = MakeParameter(mState, self, handle);
         Observe(kProgramKind, self, "GetParameter", name ? name : "null", parameter->GetType());
         return parameter;
     } catch (std::bad_alloc const&) {

@@ -50,7 +50,8 @@ protected:
     // count vertices of one float, each the number of the draw.
     void Draw(RunState const& state, DrawBounds const& bounds = {}, int count = 1) {
         std::vector<float> const vertices(static_cast<std::size_t>(count), static_cast<float>(draws++));
-        ListVertices const placed = builder.AddVertices(vertices.data(), count, 1, {});
+        ListVertices placed;
+        builder.AddVertices(vertices.data(), count, 1, placed);
         builder.AddDraw(state, false, *program, {placed, 0, count, bounds});
     }
 
@@ -83,8 +84,7 @@ protected:
             for (std::size_t i = 0; run && i < run->recordCount; ++i) {
                 Record const& record = list.records[run->firstRecord + i];
                 for (int at = record.first; at < record.first + record.count; ++at) {
-                    text += static_cast<char>('0' +
-                                              static_cast<int>(list.vertices[static_cast<std::size_t>(at)]));
+                    text += static_cast<char>('0' + static_cast<int>(list.vertices.data()[at]));
                 }
             }
         }

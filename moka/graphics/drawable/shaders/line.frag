@@ -22,6 +22,19 @@ bool within(highp float x, highp float low, highp float high) {
     return low <= x && x <= high;
 }
 
+// Along a line without dashes.
+float alongSolid(highp vec2 at, highp float halfWidth, highp float lineLength) {
+    if (uLineCapType == 0) {
+        // Both ends of a line shorter than a pixel may lie in one pixel: then the begin counts on the line, and
+        // the end behind it.
+        bool isAtBegin = at.x < 0.5 && at.x <= lineLength;
+        return clamp(0.5 + (isAtBegin ? at.x : lineLength - at.x), 0.0, 1.0);
+    }
+    highp float beyond = max(max(-at.x, at.x - lineLength), 0.0); // an end, by so much
+    if (uLineCapType == 1) return clamp(0.5 + halfWidth - length(vec2(beyond, at.y)), 0.0, 1.0);
+    return clamp(0.5 + halfWidth - beyond, 0.0, 1.0);
+}
+
 // A stretch along the line: a dash, when inside, or what lies between the end of one and the begin of the
 // next.
 struct Stretch {
@@ -30,12 +43,6 @@ struct Stretch {
     highp float right;
     bool inside;
 };
-
-Stretch solid(highp float x, highp float lineLength) {
-    if (x < 0.0) return Stretch(x, -kNowhere, 0.0, false);
-    if (x > lineLength) return Stretch(x, lineLength, kNowhere, false);
-    return Stretch(x, 0.0, lineLength, true);
-}
 
 Stretch dashed(highp float x, highp float halfWidth, highp float lineLength) {
     highp vec4 p = uDashedLinePattern;
@@ -83,25 +90,23 @@ float alongOutside(Stretch s, highp float y, highp float halfWidth) {
     return max(left, right);
 }
 
-float across(highp float y, highp float halfWidth) {
-    if (y > halfWidth - 0.5) return clamp(0.5 + halfWidth - y, 0.0, 1.0);
-    if (y < -halfWidth + 0.5) return clamp(0.5 + halfWidth + y, 0.0, 1.0);
-    return 1.0;
+float alongDashed(highp vec2 at, highp float halfWidth, highp float lineLength) {
+    Stretch s = dashed(at.x, halfWidth, lineLength);
+    return s.inside ? alongInside(s) : alongOutside(s, at.y, halfWidth);
 }
 
 void main() {
-    highp float y = vLineCoord.y;
-    highp float halfWidth = uLineInfo.x;
+    highp float halfWidth = uLineInfo.x; // 0.5 at least
     highp float lineLength = uLineInfo.y;
-    Stretch s;
+    float along;
     if (uIsDashedLine == 1) {
-        s = dashed(vLineCoord.x, halfWidth, lineLength);
+        along = alongDashed(vLineCoord, halfWidth, lineLength);
     } else {
-        s = solid(vLineCoord.x, lineLength);
+        along = alongSolid(vLineCoord, halfWidth, lineLength);
     }
-    float along = s.inside ? alongInside(s) : alongOutside(s, y, halfWidth);
+    float across = clamp(0.5 + halfWidth - abs(vLineCoord.y), 0.0, 1.0);
 
-    float alpha = min(along, across(y, halfWidth)) * uColor.a;
+    float alpha = min(along, across) * uColor.a;
     vec3 color = uColor.rgb;
     if (uHasTintColor == 1) {
         alpha *= uTintColor.a;
