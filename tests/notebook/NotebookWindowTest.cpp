@@ -312,8 +312,8 @@ TEST_F(NotebookWindowTest, TheRenderThreadAllocatesNothingForInkOnceItIsWarm) {
     ProcessResult const result =
         Start({"page.json", "--statistics", "--replay", WriteScript(script)})->Wait();
     std::smatch count;
-    ASSERT_TRUE(std::regex_search(result.out, count, std::regex("(\\d+) in the last (\\d+) frames")));
-    EXPECT_LT(std::stoi(count[1]), std::stoi(count[2])) << "more than a vector that grows now and then";
+    ASSERT_TRUE(std::regex_search(result.out, count, std::regex("(\\d+) in the last")));
+    EXPECT_LT(std::stoi(count[1]), 100) << "20 strokes made more than some vectors grow";
 }
 
 TEST_F(NotebookWindowTest, SaysWhatToDoWithoutAWindow) {
