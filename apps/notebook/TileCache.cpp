@@ -45,14 +45,19 @@ bool TileCache::Draw(IMKCanvas& screen, Viewport const& view, int pageHeight, bo
     Adapt(lastFrame);
     bool const isDone = view.zoom == mNow.zoom && Fill(FindWanted(view, pageHeight));
     if (isDone) mBefore.tiles.clear();
+    if (!isDone) ShowPaper(screen, view, pageHeight);
+    Show(screen, view, pageHeight, mBefore);
+    Show(screen, view, pageHeight, mNow);
+    return isDone;
+}
+
+// Where there are no tiles yet.
+void TileCache::ShowPaper(IMKCanvas& screen, Viewport const& view, int pageHeight) {
     MKPaint const paper = MakePaint(kPaper);
     float const left = ToFloat(-view.x);
     float const top = ToFloat(view.top - view.y);
     screen.DrawRect(left, top, left + ToFloat(view.Scale(Page::kWidth)),
                     top + ToFloat(view.Scale(pageHeight)), &paper);
-    Show(screen, view, pageHeight, mBefore);
-    Show(screen, view, pageHeight, mNow);
-    return isDone;
 }
 
 void TileCache::Show(IMKCanvas& screen, Viewport const& view, int pageHeight, Level const& level) {

@@ -71,6 +71,7 @@ private:
     double Continue(double budget);
     void DrawOn(Tile const& tile, Place const& place, Object const& object) const;
     void Adapt(double lastFrame);
+    static void ShowPaper(IMKCanvas& screen, Viewport const& view, int pageHeight);
     static void Show(IMKCanvas& screen, Viewport const& view, int pageHeight, Level const& level);
     std::size_t CountTiles() const {
         return mNow.tiles.size() + mBefore.tiles.size() + (mSpare.bitmap ? 1 : 0);
