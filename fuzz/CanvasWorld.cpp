@@ -1,29 +1,14 @@
 #include "fuzz/CanvasWorld.h"
 
-#include "moka/renderer/RendererFactory.h"
-
 namespace Moka::Fuzz {
 
 using Testing::RendererTrace;
-
-CanvasWorld::CanvasWorld(FuzzInput& bytes) : input(bytes) {
-    RendererTrace::Reset();
-    RendererTrace::SetMaxTextureSize(kMaxTexture);
-    RendererTrace::KeepRecords(false);
-    RendererTrace::DeclareRenderThread();
-    RendererFactory::AttachContext();
-    RendererTrace::DeclareNoRenderThread();
-    queue.SetAroundRun([] { RendererTrace::DeclareRenderThread(); },
-                       [] { RendererTrace::DeclareNoRenderThread(); });
-}
 
 CanvasWorld::~CanvasWorld() {
     DropAll();
     queue.RunAll();
     for (std::string const& violation : RendererTrace::GetViolations()) Require(false, violation.c_str());
     Require(RendererTrace::CountLiveObjects() == 0, "GPU objects are left");
-    RendererTrace::DeclareRenderThread();
-    RendererFactory::DetachContext();
 }
 
 IMKBitmap* CanvasWorld::PickBitmapFor(bool onRenderThread) {

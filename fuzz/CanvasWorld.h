@@ -12,8 +12,7 @@
 #include "moka/graphics/canvas/IMKCanvas.h"
 #include "moka/graphics/canvas/IMKPenCanvas.h"
 #include "moka/graphics/drawable/IMKCustomDrawable.h"
-#include "tests/support/Queues.h"
-#include "tests/support/RendererTrace.h"
+#include "tests/support/PumpedRenderer.h"
 
 #include <array>
 #include <iterator>
@@ -58,7 +57,7 @@ struct Slot {
 
 class CanvasWorld {
 public:
-    explicit CanvasWorld(FuzzInput& input);
+    explicit CanvasWorld(FuzzInput& bytes) : input(bytes) { Testing::RendererTrace::KeepRecords(false); }
     ~CanvasWorld();
     CanvasWorld(CanvasWorld const&) = delete;
     CanvasWorld& operator=(CanvasWorld const&) = delete;
@@ -86,7 +85,7 @@ public:
     unsigned char* NewBuffer(std::size_t count);
 
     FuzzInput& input;
-    Testing::HandPumpedQueue queue;
+    Testing::PumpedRenderer queue{kMaxTexture};
     std::array<Slot<IMKBitmap>, 6> bitmaps;
     std::array<Slot<IMKCanvas>, 4> canvases;
     std::array<Slot<IMKPenCanvas>, 2> penCanvases;
@@ -116,14 +115,9 @@ void DoOne(Steps const& steps, FuzzInput& input, Arguments&... arguments) {
     steps[input.Below(static_cast<int>(std::size(steps)))](arguments...);
 }
 
-// One operation out of the input's next bytes.
 using Operation = void (*)(CanvasWorld& world);
 
-// On bitmaps: make, share, update, read, drop.
-std::vector<Operation> const& GetBitmapOperations();
-// On canvases: make, share, drop; their state, and what pen canvases have.
-std::vector<Operation> const& GetCanvasOperations();
-// What a canvas draws.
-std::vector<Operation> const& GetDrawOperations();
+// One operation on bitmaps, canvases and drawables, out of the input's next bytes.
+void DoAny(CanvasWorld& world);
 
 } // namespace Moka::Fuzz

@@ -5,7 +5,6 @@
 #include "moka/base/Bitmap.h"
 #include "moka/base/BitmapFactory.h"
 #include "moka/base/String.h"
-#include "moka/base/log/LogSink.h"
 
 #include <memory>
 #include <string>
@@ -99,11 +98,6 @@ void DecodeAll(std::uint8_t const* data, std::size_t size) {
 
 } // namespace
 } // namespace Moka::Fuzz
-
-extern "C" int LLVMFuzzerInitialize(int*, char***) {
-    Moka::SetLogSink([](Moka::LogLine const&) {});
-    return 0;
-}
 
 extern "C" int LLVMFuzzerTestOneInput(std::uint8_t const* data, std::size_t size) {
     Moka::Fuzz::DecodeAll(data, size);

@@ -2,7 +2,6 @@
 // records it: the recording is a scene again. A text that is no scene is refused with a message of one line that
 // begins with the file and a line of it.
 #include "fuzz/CanvasWorld.h"
-#include "moka/base/log/LogSink.h"
 #include "moka/graphics/factory/MKGraphicsFactory.h"
 #include "scenes/SceneError.h"
 #include "scenes/SceneFile.h"
@@ -98,11 +97,6 @@ void ReadAndDraw(std::string_view text) {
 
 } // namespace
 } // namespace Moka::Fuzz
-
-extern "C" int LLVMFuzzerInitialize(int*, char***) {
-    Moka::SetLogSink([](Moka::LogLine const&) {});
-    return 0;
-}
 
 extern "C" int LLVMFuzzerTestOneInput(std::uint8_t const* data, std::size_t size) {
     Moka::Fuzz::ReadAndDraw({reinterpret_cast<char const*>(data), size});

@@ -63,10 +63,14 @@ void DrawCrossFade(IMKCanvas& canvas, SceneStage& stage) {
     BitmapPtr const night = MakeBitmap(stage, "gradient", 96, 110);
     for (int i = 0; i < 5; ++i) {
         float const x = 14 + 106 * static_cast<float>(i);
-        // The drawable takes these references over.
-        auto const fade = MakeDrawable<MKBlendedBitmapDrawable>(
-            stage.GetQueue(), BitmapPtr(day).Release(), BitmapPtr(night).Release(), RectF(0, 0, 96, 110),
-            RectF(x, 14, x + 96, 124), 0.0f, 0.0f);
+        BitmapPtr first = day;
+        BitmapPtr second = night;
+        auto const fade = MakeDrawable<MKBlendedBitmapDrawable>(stage.GetQueue(), first.Get(), second.Get(),
+                                                                RectF(0, 0, 96, 110),
+                                                                RectF(x, 14, x + 96, 124), 0.0f, 0.0f);
+        // The drawable has taken these references over.
+        static_cast<void>(first.Release());
+        static_cast<void>(second.Release());
         MKPaint paint;
         paint.SetAlpha(static_cast<float>(i) / 4);
         canvas.Draw(fade.Get(), &paint);

@@ -10,6 +10,7 @@
 #include <cstring>
 #include <mutex>
 #include <new>
+#include <string_view>
 #include <utility>
 #include <vector>
 
@@ -39,6 +40,9 @@ struct Event {
 
 constexpr std::size_t kBufferedEvents = 4096;
 constexpr std::int64_t kOldest = 500'000'000; // nanoseconds until buffered events are written
+
+constexpr std::string_view kSeparator = ",\n";
+constexpr std::string_view kEnd = "\n]\n";
 
 // What is between quotes. Names of threads may be anything.
 void AppendText(std::string& out, char const* text) {
@@ -98,7 +102,8 @@ void AppendName(std::string& out, char const* what, int thread, char const* name
     out += "}}";
 }
 
-// The file. Whole blocks or nothing: a write that fails is cut off again, so that what is there can be read.
+// The file. A write that fails is cut off after the last whole event that leaves room for the end, so that what is
+// there can be read.
 class TraceFile {
 public:
     bool Open(std::string const& path) {
@@ -112,15 +117,19 @@ public:
     std::string const& GetPath() const { return mPath; }
     std::string const& GetFailure() const { return mFailure; }
 
-    // False once; what comes later is dropped without a word.
+    // False once; what comes later is dropped without a word. Every event of a block begins with kSeparator.
     bool Write(std::string const& block) {
         if (!mFailure.empty()) return true;
         std::size_t done = 0;
         while (done < block.size()) {
             ssize_t const written = write(mFile, block.data() + done, block.size() - done);
             if (written < 0 && errno == EINTR) continue;
-            if (written <= 0)
-                return Fail(written < 0 ? std::strerror(errno) : "the file takes no more bytes");
+            if (written <= 0) {
+                char const* const reason =
+                    written < 0 ? std::strerror(errno) : "the file takes no more bytes";
+                mBytes += CountWhole(block, done);
+                return Fail(reason);
+            }
             done += static_cast<std::size_t>(written);
         }
         mBytes += static_cast<off_t>(done);
@@ -129,8 +138,7 @@ public:
 
     void Close() {
         // Not through Write: after a failure there may be room for the end all the same.
-        char const end[] = "\n]\n";
-        if (write(mFile, end, sizeof end - 1) != sizeof end - 1 && mFailure.empty())
+        if (write(mFile, kEnd.data(), kEnd.size()) != static_cast<ssize_t>(kEnd.size()) && mFailure.empty())
             mFailure = std::strerror(errno);
         if (close(mFile) != 0 && mFailure.empty()) mFailure = std::strerror(errno);
         mFile = -1;
@@ -143,6 +151,12 @@ public:
     }
 
 private:
+    // Bytes of a block up to the end of the last event that was written with room for the file's end.
+    static off_t CountWhole(std::string const& block, std::size_t written) {
+        std::size_t const whole = block.rfind(kSeparator, written - std::min(written, kEnd.size()));
+        return whole == std::string::npos ? 0 : static_cast<off_t>(whole);
+    }
+
     int mFile = -1;
     std::string mPath;
     off_t mBytes = 0;
@@ -191,7 +205,13 @@ private:
 };
 
 thread_local unsigned theNamedIn = 0;
-thread_local char const* theTaskName = nullptr;
+
+// Of the task at hand and of the one before.
+struct TaskNames {
+    Trace::TaskName current;
+    char const* last;
+};
+thread_local TaskNames theTaskNames{};
 
 void StopAtExit() { Trace::Stop(nullptr); }
 
@@ -290,7 +310,7 @@ bool Writer::WriteEvents(std::int64_t start) noexcept {
 void Writer::Format(std::int64_t start) {
     mText.clear();
     for (Event const& event : mWriting) {
-        mText += ",\n";
+        mText += kSeparator;
         if (event.category) {
             AppendEvent(mText, event, start);
         } else {
@@ -326,10 +346,17 @@ void Trace::Add(char const* category, char const* name, std::int64_t begin, std:
     Writer::Get(theIsOn).Add(event);
 }
 
-char const* Trace::TakeTaskName() noexcept { return std::exchange(theTaskName, nullptr); }
+Trace::TaskName Trace::TakeTaskName() noexcept {
+    TaskNames& names = theTaskNames;
+    names.last = names.current.name;
+    return {std::exchange(names.current.name, nullptr), names.current.changed};
+}
 
 void Trace::SetTaskName(char const* name) noexcept {
-    if (!theTaskName) theTaskName = name;
+    TaskNames& names = theTaskNames;
+    if (names.current.name) return;
+    names.current.name = name;
+    if (name != names.last) names.current.changed = GetTime();
 }
 
 } // namespace Moka

@@ -9,7 +9,7 @@
 /// Fails:   a file that cannot be opened is false with the reason. When writing fails later, one warning is
 ///          logged, the file is cut after the last event that fits, and tracing stops; the program goes on.
 /// Lost:    nothing that ended before Stop() or the normal end of the process. A scope that is open then is
-///          not in the file.
+///          not in the file, nor are the last tasks of one kind of a queue that is at work.
 #pragma once
 
 #include "moka/base/Export.h"
@@ -55,8 +55,12 @@ public:
     static void NameTask(char const* name) noexcept {
         if (IsOn()) SetTaskName(name);
     }
-    /// The name given since the last call, or null.
-    static char const* TakeTaskName() noexcept;
+    /// The name given since the last call, or null. Changed: when it was given, if it differs from the name before.
+    struct TaskName {
+        char const* name;
+        std::int64_t changed;
+    };
+    static TaskName TakeTaskName() noexcept;
 
 private:
     static void SetTaskName(char const* name) noexcept;

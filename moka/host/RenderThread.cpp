@@ -54,12 +54,12 @@ private:
     std::promise<bool> mResult; // here, so that the caller that it wakes cannot destroy it at work
 };
 
-// A trace for as long as a render thread runs, or, when the environment asks for it, from now on.
+// A trace for as long as a render thread runs, or, when the environment asks for it, from the first one on.
 class ThreadTrace {
 public:
     explicit ThreadTrace(std::string const& path) : mIsOwn(!path.empty()) {
-        char const* const wanted = mIsOwn ? path.c_str() : std::getenv("MOKA_TRACE");
-        if (!wanted || !*wanted || (!mIsOwn && Trace::IsOn())) return;
+        char const* const wanted = mIsOwn ? path.c_str() : TakeEnvironment();
+        if (!wanted || !*wanted) return;
         std::string error;
         mIsOn = Trace::Start(wanted, &error);
         if (!mIsOn) __android_log_print(ANDROID_LOG_WARN, "mok_log", "RenderThread: %s", error.c_str());
@@ -74,6 +74,12 @@ public:
     }
 
 private:
+    // Once in a process: a file that could not be written or that filled the disk is told once.
+    static char const* TakeEnvironment() {
+        static std::atomic<bool> isTaken{false};
+        return Trace::IsOn() || isTaken.exchange(true) ? nullptr : std::getenv("MOKA_TRACE");
+    }
+
     bool const mIsOwn;
     bool mIsOn = false;
 };

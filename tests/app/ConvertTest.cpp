@@ -21,7 +21,7 @@ TEST_F(ConvertTest, EveryFormatBecomesEveryFormat) {
         Save(MakeAlphaPattern(61, 47), "in." + from, 90);
         for (std::string const to : {"png", "jpg", "webp", "mki"}) {
             std::string const output = from + "-to." + to;
-            RunWell({"convert", "in." + from, output});
+            RunWell("convert in." + from + " " + output);
             ExpectEncodes("in." + from, output, to == "jpg" ? 90 : 100);
             if (to != "jpg") ExpectSamePixels(Load("in." + from), output);
         }
@@ -33,35 +33,30 @@ TEST_F(ConvertTest, ADashIsStandardInputAndOutput) {
     Save(image, "in.webp");
     ProcessOptions options;
     options.in = Path("in.webp");
-    ProcessResult const piped = Run({"convert", "-", "-"}, options);
-    EXPECT_EQ(piped.status, 0) << piped.err;
-    WriteFile("out.png", piped.out);
-    EXPECT_EQ(piped.out.substr(1, 3), "PNG");
+    WriteFile("out.png", RunWell("convert - -", options));
+    EXPECT_EQ(ReadFile("out.png").substr(1, 3), "PNG");
     ExpectSamePixels(image, "out.png");
-    EXPECT_EQ(Run({"convert", "-", "-", "--to", "mki"}, options).out.substr(0, 4), "MKI1");
-    EXPECT_THAT(Run({"convert", "-", "out.mki"}, options).out, HasSubstr("standard input (WebP 61x47) -> "));
+    EXPECT_EQ(RunWell("convert - - --to mki", options).substr(0, 4), "MKI1");
+    EXPECT_THAT(RunWell("convert - out.mki", options), HasSubstr("standard input (WebP 61x47) -> "));
     ExpectSamePixels(image, "out.mki");
-    EXPECT_THAT(Run({"info", "-"}, options).out, HasSubstr("standard input: WebP, 61x47, alpha, "));
+    EXPECT_THAT(RunWell("info -", options), HasSubstr("standard input: WebP, 61x47, alpha, "));
     WriteFile("scene.json", R"({"size": [7, 5], "background": "#102030", "operations": []})");
     options.in = Path("scene.json");
-    WriteFile("drawn.webp", Run({"draw", "-", "-o", "-", "--to", "webp"}, options).out);
+    WriteFile("drawn.webp", RunWell("draw - -o - --to webp", options));
     EXPECT_EQ(Load("drawn.webp").width, 7);
-    // Where nobody can write, nothing is left either.
-    options.out = "/dev/full";
-    ExpectFails({"convert", "in.webp", "-"}, kFailed, {"standard output", "No space"}, options);
 }
 
 TEST_F(ConvertTest, TellsWhatItDidUnlessQuiet) {
     Save(MakeGradient(30, 20), "in.png");
-    std::string const told = RunWell({"convert", "in.png", "out.mki"});
+    std::string const told = RunWell("convert in.png out.mki");
     EXPECT_THAT(told, HasSubstr("in.png (PNG 30x20) -> out.mki (mki, "));
     EXPECT_THAT(told, HasSubstr(std::to_string(ReadFile("out.mki").size()) + " bytes), 1 strip, "));
-    EXPECT_THAT(RunWell({"convert", "in.png", "out.mki", "--size", "15x10"}), HasSubstr("(mki 15x10, "));
-    EXPECT_EQ(RunWell({"convert", "in.png", "out.mki", "-q"}), "");
+    EXPECT_THAT(RunWell("convert in.png out.mki --size 15x10"), HasSubstr("(mki 15x10, "));
+    EXPECT_EQ(RunWell("convert in.png out.mki -q"), "");
     Picture const tall = MakeGradient(64, 321);
     Save(tall, "tall.webp");
     std::filesystem::rename(Path("tall.webp"), Path("tall.jpg")); // content decides
-    EXPECT_THAT(RunWell({"convert", "tall.jpg", "tall.mki", "--max-texture", "64"}),
+    EXPECT_THAT(RunWell("convert tall.jpg tall.mki --max-texture 64"),
                 AllOf(HasSubstr("tall.jpg (WebP 64x321)"), HasSubstr("6 strips")));
     ExpectSamePixels(tall, "tall.mki");
 }

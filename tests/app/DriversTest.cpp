@@ -56,11 +56,8 @@ Slack FindAllowed(Scene const& scene) {
     return allowed;
 }
 
-int CountOver(Picture const& a, Picture const& b, int steps) {
-    Slack same(a.width, a.height);
-    for (int y = 0; y < a.height; ++y) {
-        for (int x = 0; x < a.width; ++x) same.Set(x, y, steps);
-    }
+int CountOver(Picture const& a, Picture const& b, unsigned char steps) {
+    Slack const same(a.width, a.height, steps);
     return CompareImages(a, b, &same).differingPixels;
 }
 
@@ -69,9 +66,9 @@ protected:
     void DrawAll(std::string const& folder, std::vector<std::string> const& environment) {
         ProcessOptions driver;
         driver.environment = environment;
-        ProcessResult const drawn = Run({"gallery", "--mki", "--out", folder}, driver);
+        ProcessResult const drawn = Run("gallery --mki --out " + folder, driver);
         ASSERT_EQ(drawn.status, 0) << drawn.err;
-        std::string const device = Run({"info", "--device"}, driver).out;
+        std::string const device = Run("info --device", driver).out;
         mReport += device.substr(0, device.find('\n')) + "\n";
     }
 

@@ -41,7 +41,7 @@ TEST_F(InfoTest, TellsFramesAndShowsNoControlCharacter) {
 }
 
 TEST_F(InfoTest, TellsTheDeviceWithoutAFile) {
-    std::string const told = RunWell({"info", "--device"});
+    std::string const told = RunWell("info --device");
     EXPECT_THAT(told, MatchesRegex("renderer +[^\n]+\nvendor +[^\n]+\nversion +OpenGL ES 3[^\n]+\n"
                                    "EGL +1\\.[^\n]+\nreached through +[^\n]+\nlargest texture +[0-9]+\n"));
 }

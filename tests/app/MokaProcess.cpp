@@ -1,6 +1,5 @@
 #include "tests/app/MokaProcess.h"
 
-#include <algorithm>
 #include <cerrno>
 #include <csignal>
 #include <cstdlib>
@@ -29,10 +28,6 @@ std::string ReadAll(int file) {
 
 } // namespace
 
-int ProcessResult::CountErrorLines() const {
-    return static_cast<int>(std::count(err.begin(), err.end(), '\n'));
-}
-
 MokaProcess::MokaProcess(std::string folder, std::vector<std::string> arguments, ProcessOptions options)
     : mFolder(std::move(folder)), mOut(MakeCapture("out")), mErr(MakeCapture("err")), mPid(fork()) {
     if (mPid < 0) throw std::system_error(errno, std::generic_category(), "no process can be started");
@@ -49,8 +44,6 @@ MokaProcess::~MokaProcess() {
 }
 
 void MokaProcess::RunChild(std::vector<std::string> const& arguments, ProcessOptions const& options) const {
-    // A shell's background job ignores it, and so would the program.
-    std::signal(SIGINT, SIG_DFL);
     std::vector<char*> argv{const_cast<char*>("moka")};
     for (std::string const& argument : arguments) argv.push_back(const_cast<char*>(argument.c_str()));
     argv.push_back(nullptr);
@@ -58,7 +51,8 @@ void MokaProcess::RunChild(std::vector<std::string> const& arguments, ProcessOpt
     int const out = options.out.empty() ? mOut : open(options.out.c_str(), O_WRONLY);
     dup2(out, STDOUT_FILENO);
     if (!options.in.empty()) dup2(open(options.in.c_str(), O_RDONLY), STDIN_FILENO);
-    dup2(options.terminal >= 0 ? options.terminal : mErr, STDERR_FILENO);
+    dup2(mErr, STDERR_FILENO);
+    // A shell's background job ignores some, and so would the program.
     for (int const number : {SIGINT, SIGTERM, SIGHUP})
         std::signal(number, number == options.ignoredSignal ? SIG_IGN : SIG_DFL);
     if (chdir(mFolder.c_str()) != 0) _exit(126);

@@ -12,15 +12,12 @@ struct ProcessResult {
     int signal = 0;
     std::string out;
     std::string err;
-
-    int CountErrorLines() const;
 };
 
 struct ProcessOptions {
     std::string program = MOKA_EXECUTABLE;
     std::vector<std::string> environment; // "NAME=value", beside what the test has
     long fileSizeLimit = 0;               // bytes; 0 for none
-    int terminal = -1;                    // a terminal to use as stderr; err then stays empty
     std::string out;                      // a file to use as stdout
     std::string in;                       // a file to use as stdin
     int ignoredSignal = 0;                // all others have their defaults, whatever the test's own are

@@ -1,8 +1,13 @@
-// Parts of programs that no run shows: the comparison of the demonstration, and which of several errors is told.
+// Parts of programs that no run shows: the comparison of the demonstration, which of several errors is told, and the line
+// of progress on a terminal.
 #include "apps/moka/LogCollector.h"
+#include "apps/moka/Progress.h"
 #include "apps/samples/Compare.h"
 #include "moka/base/log/AndroidLog.h"
 #include "tests/app/ToolTest.h"
+
+#include <pty.h>
+#include <unistd.h>
 
 namespace Moka::Testing {
 namespace {
@@ -28,6 +33,26 @@ TEST_F(SamplesTest, OfTwoErrorsTheFirstIsTheCause) {
     for (char const* const text : {"the cause", "a consequence"})
         __android_log_print(ANDROID_LOG_ERROR, "test", "%s", text);
     EXPECT_EQ(log.GetError(), "the cause");
+}
+
+TEST_F(SamplesTest, ATerminalShowsHowManyFilesAreDoneAndIsCleanAtTheEnd) {
+    int own = -1;
+    int other = -1;
+    if (openpty(&own, &other, nullptr, nullptr, nullptr) != 0) GTEST_SKIP() << "is /dev/pts mounted?";
+    int const stderrOfTest = dup(STDERR_FILENO);
+    dup2(other, STDERR_FILENO);
+    {
+        Tool::Progress progress(Tool::Progress::Line);
+        progress.SetCount(9, 10);
+        std::this_thread::sleep_for(
+            std::chrono::milliseconds(1100)); // work of less than a second shows nothing
+    }
+    dup2(stderrOfTest, STDERR_FILENO);
+    char shown[512];
+    std::string const text(shown, static_cast<std::size_t>(read(own, shown, sizeof(shown))));
+    EXPECT_THAT(text,
+                ::testing::MatchesRegex("(\r.\\[Kconvert  9/10  90%  [0-9.]+ files/s  0:00 left)+\r.\\[K"));
+    for (int const file : {own, other, stderrOfTest}) close(file);
 }
 
 } // namespace

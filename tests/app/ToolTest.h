@@ -15,6 +15,13 @@ namespace Moka::Testing {
 constexpr int kFailed = 1;
 constexpr int kUsage = 2;
 
+// Words of a command line, or one by one where they hold spaces. EMPTY stands for an empty one.
+struct Arguments : std::vector<std::string> {
+    using vector::vector;
+    Arguments(char const* line);
+    Arguments(std::string const& line) : Arguments(line.c_str()) {}
+};
+
 // The options of a process that finds no driver.
 ProcessOptions WithoutDriver();
 
@@ -34,12 +41,13 @@ protected:
     // Sorted; everything, hidden files as well.
     std::vector<std::string> List(std::string const& folder = ".") const;
 
-    ProcessResult Run(std::vector<std::string> const& arguments, ProcessOptions const& options = {}) const;
+    ProcessResult Run(Arguments const& arguments, ProcessOptions const& options = {}) const;
     // Fails the test unless the tool succeeds without a word on stderr.
-    std::string RunWell(std::vector<std::string> const& arguments) const;
-    // One line on stderr that holds every part, nothing on stdout, and the folder as it was.
-    void ExpectFails(std::vector<std::string> const& arguments, int status,
-                     std::vector<std::string> const& parts, ProcessOptions const& options = {}) const;
+    std::string RunWell(Arguments const& arguments, ProcessOptions const& options = {}) const;
+    // One line on stderr that holds every part (they are separated by bars), nothing on stdout, and the folder as it
+    // was.
+    void ExpectFails(Arguments const& arguments, int status, std::string const& parts,
+                     ProcessOptions const& options = {}) const;
     void ExpectSamePixels(Picture const& image, std::string const& name) const;
 
 private:

@@ -71,11 +71,31 @@ public:
     static inline int destroyed = 0;
 };
 
-TEST(Registration, FinalizeDestroysTheDisplay) {
+TEST(Registration, DisplayNativesMakeChangeCopyAndDestroyDisplays) {
     LoadDisplay(0);
-    Display const* const display = new CountedDisplay;
-    auto const handle = static_cast<jlong>(reinterpret_cast<std::intptr_t>(display));
-    GetNative<void(JNIEnv*, jclass, jlong)>(1)(nullptr, nullptr, handle);
+    auto const init = GetNative<jlong(JNIEnv*, jclass, jint, jint, jfloat, jint, jint, jfloat, jfloat, jint,
+                                      jfloat, jfloat, jint, jint, jint, jboolean, jlong)>(0);
+    jlong const handle = init(nullptr, nullptr, 1, -2, 3.5f, 4, 5, 6.25f, 7.125f, 8, 9.5f, -10.5f, 11, 12, 13,
+                              JNI_TRUE, 0x1234567890abL);
+    GetNative<void(JNIEnv*, jclass, jlong, jint)>(3)(nullptr, nullptr, handle, -3);
+    GetNative<void(JNIEnv*, jclass, jlong, jint)>(4)(nullptr, nullptr, handle, 99);
+    auto* const copy = new CountedDisplay;
+    auto const copied = static_cast<jlong>(reinterpret_cast<std::intptr_t>(copy));
+    GetNative<void(JNIEnv*, jclass, jlong, jlong)>(2)(nullptr, nullptr, copied, handle);
+    auto const finalize = GetNative<void(JNIEnv*, jclass, jlong)>(1);
+    finalize(nullptr, nullptr, handle);
+    EXPECT_THAT((std::vector<double>{double(copy->GetWidthPixels()), double(copy->GetHeightPixels()),
+                                     copy->GetSystemDensity(), double(copy->GetLocalWidthPixels()),
+                                     double(copy->GetLocalHeightPixels()), copy->GetDensity(),
+                                     copy->GetScaledDensity(), copy->GetXdpi(), copy->GetYdpi()}),
+                ElementsAre(1, -2, 3.5, 4, 5, 6.25, 7.125, 9.5, -10.5));
+    EXPECT_EQ(copy->GetLayoutDirection(), Display::LayoutDirection{11});
+    EXPECT_EQ(copy->GetOrientation(), Display::Orientation{12});
+    EXPECT_EQ(copy->GetScreenOrientation(), Display::ScreenOrientation{99});
+    EXPECT_EQ(copy->GetAppVsyncOffsetNanos(), 0x1234567890abL);
+    EXPECT_EQ(copy->GetDebugLevel(), -3);
+    finalize(nullptr, nullptr, copied);
+    finalize(nullptr, nullptr, 0);
     EXPECT_EQ(CountedDisplay::destroyed, 1);
 }
 

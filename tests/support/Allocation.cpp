@@ -4,63 +4,97 @@
 #include <cstdlib>
 #include <new>
 
+// The leak checker's, where it is there.
+extern "C" __attribute__((weak)) void __lsan_ignore_object(void const* block);
+
+namespace Moka::Testing {
 namespace {
 
-using Moka::Testing::FailAllocations;
-using Moka::Testing::NoArrayMemory;
-
 thread_local int allocations = 0;
+thread_local int pauses = 0;
 std::atomic<std::size_t> liveBytes{0};
 std::atomic<std::size_t> peakBytes{0};
-constexpr std::size_t kPrefix = 16; // for the size of an array; keeps the alignment
+std::atomic<bool> mayLeak{false};
 
-void* Allocate(std::size_t size) noexcept {
-    ++allocations;
-    return FailAllocations::sAll > 0 ? nullptr : std::malloc(size + kPrefix);
-}
+struct KindOfAllocation {
+    std::atomic<bool> isArmed{false};
+    std::atomic<int> count{0};
+    std::atomic<std::int64_t> live{0};
+    int first = 0;
+    bool all = false;
+};
+KindOfAllocation theKinds[3];
 
-void* AllocateArray(std::size_t size) noexcept {
-    auto* const block = static_cast<unsigned char*>(Allocate(size));
-    if (!block) return nullptr;
-    *reinterpret_cast<std::size_t*>(block) = size;
+KindOfAllocation& Get(Faults::Kind kind) { return theKinds[static_cast<int>(kind)]; }
+
+// Ahead of each block; keeps the alignment.
+struct alignas(std::max_align_t) Header {
+    std::size_t arrayBytes; // 0 where it is no array
+    bool isCounted;
+};
+
+void CountArray(std::size_t size) {
     std::size_t const live = liveBytes += size;
     std::size_t peak = peakBytes;
     while (live > peak && !peakBytes.compare_exchange_weak(peak, live)) {
     }
-    return block + kPrefix;
 }
 
-void* OrThrow(void* block) {
-    if (!block) throw std::bad_alloc();
-    return block;
+void* Allocate(std::size_t size, bool isArray, bool throws) {
+    ++allocations;
+    bool const fails = FailAllocations::sAll > 0 || (isArray && !throws && NoArrayMemory::sArrays > 0) ||
+                       (throws ? pauses == 0 && Faults::Fails(Faults::Kind::Throwing)
+                               : Faults::Fails(Faults::Kind::Objects));
+    void* const memory = fails ? nullptr : std::malloc(sizeof(Header) + size);
+    if (!memory && throws) throw std::bad_alloc();
+    if (!memory) return nullptr;
+    if (isArray) CountArray(size);
+    if (!throws) Faults::AddLive(Faults::Kind::Objects, 1);
+    if (!throws && mayLeak && __lsan_ignore_object) __lsan_ignore_object(memory);
+    return new (memory) Header{isArray ? size : 0, !throws} + 1;
 }
 
-void FreeArray(void* memory) noexcept {
+void Free(void* memory) noexcept {
     if (!memory) return;
-    auto* const block = static_cast<unsigned char*>(memory) - kPrefix;
-    liveBytes -= *reinterpret_cast<std::size_t*>(block);
-    std::free(block);
+    Header* const header = static_cast<Header*>(memory) - 1;
+    liveBytes -= header->arrayBytes;
+    if (header->isCounted) Faults::AddLive(Faults::Kind::Objects, -1);
+    std::free(header);
 }
 
 } // namespace
 
-void* operator new(std::size_t size) { return OrThrow(Allocate(size)); }
-void* operator new[](std::size_t size) { return OrThrow(AllocateArray(size)); }
-void* operator new(std::size_t size, std::nothrow_t const&) noexcept { return Allocate(size); }
-void* operator new[](std::size_t size, std::nothrow_t const&) noexcept {
-    return NoArrayMemory::sArrays > 0 ? nullptr : AllocateArray(size);
-}
-void operator delete(void* block) noexcept { std::free(block); }
-void operator delete[](void* block) noexcept { FreeArray(block); }
-void operator delete(void* block, std::size_t) noexcept { std::free(block); }
-void operator delete[](void* block, std::size_t) noexcept { FreeArray(block); }
-void operator delete(void* block, std::nothrow_t const&) noexcept { std::free(block); }
-void operator delete[](void* block, std::nothrow_t const&) noexcept { FreeArray(block); }
-
-namespace Moka::Testing {
-
 thread_local int FailAllocations::sAll = 0;
 thread_local int NoArrayMemory::sArrays = 0;
+
+void Faults::Arm(Kind kind, int k, bool all) {
+    KindOfAllocation& armed = Get(kind);
+    armed.first = k;
+    armed.all = all;
+    armed.count = 0;
+    armed.isArmed = true;
+}
+
+int Faults::Disarm() {
+    int count = 0;
+    for (KindOfAllocation& kind : theKinds)
+        if (kind.isArmed.exchange(false)) count = kind.count;
+    return count;
+}
+
+bool Faults::Fails(Kind kind) {
+    KindOfAllocation& armed = Get(kind);
+    if (!armed.isArmed) return false;
+    int const ordinal = ++armed.count;
+    return armed.first > 0 && (ordinal == armed.first || (armed.all && ordinal > armed.first));
+}
+
+Faults::Pause::Pause() { ++pauses; }
+Faults::Pause::~Pause() { --pauses; }
+
+std::int64_t Faults::CountLive(Kind kind) { return Get(kind).live; }
+void Faults::AddLive(Kind kind, int count) { Get(kind).live += count; }
+void Faults::AcceptLeaks() { mayLeak = true; }
 
 std::size_t ArrayMemory::GetLive() { return liveBytes; }
 std::size_t ArrayMemory::GetPeak() { return peakBytes; }
@@ -69,3 +103,17 @@ void ArrayMemory::ResetPeak() { peakBytes = liveBytes.load(); }
 int GetAllocationCount() { return allocations; }
 
 } // namespace Moka::Testing
+
+using Moka::Testing::Allocate;
+using Moka::Testing::Free;
+
+void* operator new(std::size_t size) { return Allocate(size, false, true); }
+void* operator new[](std::size_t size) { return Allocate(size, true, true); }
+void* operator new(std::size_t size, std::nothrow_t const&) noexcept { return Allocate(size, false, false); }
+void* operator new[](std::size_t size, std::nothrow_t const&) noexcept { return Allocate(size, true, false); }
+void operator delete(void* block) noexcept { Free(block); }
+void operator delete[](void* block) noexcept { Free(block); }
+void operator delete(void* block, std::size_t) noexcept { Free(block); }
+void operator delete[](void* block, std::size_t) noexcept { Free(block); }
+void operator delete(void* block, std::nothrow_t const&) noexcept { Free(block); }
+void operator delete[](void* block, std::nothrow_t const&) noexcept { Free(block); }

@@ -3,6 +3,7 @@
 #pragma once
 
 #include <cstddef>
+#include <cstdint>
 
 namespace Moka::Testing {
 
@@ -17,6 +18,7 @@ public:
 
     static thread_local int sAll;
 };
+
 class NoArrayMemory {
 public:
     NoArrayMemory() { ++sArrays; }
@@ -25,6 +27,39 @@ public:
     NoArrayMemory& operator=(NoArrayMemory const&) = delete;
 
     static thread_local int sArrays;
+};
+
+// Makes the k-th allocation of a kind in the process fail, and knows how many are still alive. Which one is the k-th
+// is only certain while one thread allocates.
+class Faults {
+public:
+    // What operator new(nothrow) gives; what operator new gives or throws for, of which nobody counts the living; the
+    // memory of tasks, where the program wraps the functions of TaskMemory.h (tests/trust/TaskFaults.cpp).
+    enum class Kind { Objects, Throwing, Tasks };
+
+    // From now on: counts the allocations of a kind, and fails the k-th of them (0 fails none), or all from the k-th
+    // on.
+    static void Arm(Kind kind, int k, bool all);
+    // How many of the kind there were since, failed ones included.
+    static int Disarm();
+    // For an allocation of the kind that comes now.
+    static bool Fails(Kind kind);
+
+    // While one lives, those of its thread's allocations that throw neither fail nor count.
+    class Pause {
+    public:
+        Pause();
+        ~Pause();
+        Pause(Pause const&) = delete;
+        Pause& operator=(Pause const&) = delete;
+    };
+
+    // Not yet freed.
+    static std::int64_t CountLive(Kind kind);
+    static void AddLive(Kind kind, int count);
+    // From now on a leak checker takes what operator new(nothrow) gives for used: it may leak as docs/ownership.md
+    // lists.
+    static void AcceptLeaks();
 };
 
 // Bytes allocated by array new and not deleted, in the whole process: pixel buffers and little else.

@@ -33,17 +33,12 @@ HandPumpedQueue::~HandPumpedQueue() = default;
 
 bool HandPumpedQueue::Post(ITask* task) {
     std::lock_guard<std::mutex> lock(mMutex);
-    if (!task) {
-        ++mCounts.null;
-        return true;
-    }
-    if (!Accepts(++mCounts.offered, task)) {
-        ++mCounts.refused;
-        return false;
-    }
-    ++mCounts.posted;
-    mTasks.emplace_back(task);
-    return true;
+    mNull += task ? 0 : 1;
+    if (!task) return true;
+    bool const isAccepted = Accepts(++mOffered, task);
+    mRefused += isAccepted ? 0 : 1;
+    if (isAccepted) mTasks.emplace_back(task);
+    return isAccepted;
 }
 
 bool HandPumpedQueue::Accepts(int, ITask*) { return true; }
@@ -52,7 +47,7 @@ void HandPumpedQueue::WaitForTasks() {
     if (tRunning == this) return;
     {
         std::lock_guard<std::mutex> lock(mMutex);
-        ++mCounts.waits;
+        ++mWaits;
     }
     RunAll();
 }
@@ -67,7 +62,7 @@ std::unique_ptr<ITask> HandPumpedQueue::TakeFirst() {
     if (mTasks.empty()) return nullptr;
     std::unique_ptr<ITask> task = std::move(mTasks.front());
     mTasks.pop_front();
-    ++mCounts.run;
+    ++mRun;
     return task;
 }
 
@@ -86,21 +81,5 @@ int HandPumpedQueue::RunAll() {
     while (RunOne()) ++count;
     return count;
 }
-
-int HandPumpedQueue::Count(int Counts::*counter) const {
-    std::lock_guard<std::mutex> lock(mMutex);
-    return mCounts.*counter;
-}
-
-int HandPumpedQueue::GetPendingCount() const {
-    std::lock_guard<std::mutex> lock(mMutex);
-    return static_cast<int>(mTasks.size());
-}
-
-int HandPumpedQueue::GetPostedCount() const { return Count(&Counts::posted); }
-int HandPumpedQueue::GetNullCount() const { return Count(&Counts::null); }
-int HandPumpedQueue::GetRunCount() const { return Count(&Counts::run); }
-int HandPumpedQueue::GetRefusedCount() const { return Count(&Counts::refused); }
-int HandPumpedQueue::GetWaitCount() const { return Count(&Counts::waits); }
 
 } // namespace Moka::Testing

@@ -35,33 +35,44 @@ public:
     bool RunOne(); // false when nothing is stored
     int RunAll();  // also what the tasks post; returns how many
 
-    int GetPendingCount() const;
-    int GetPostedCount() const;  // accepted tasks
-    int GetNullCount() const;    // null tasks
-    int GetRunCount() const;     // tasks run
-    int GetRefusedCount() const; // by a derived queue
-    int GetWaitCount() const;
+    int GetPendingCount() const {
+        return Read([this] { return static_cast<int>(mTasks.size()); });
+    }
+    int GetPostedCount() const {
+        return Read([this] { return mOffered - mRefused; });
+    } // accepted tasks
+    int GetNullCount() const {
+        return Read([this] { return mNull; });
+    }
+    int GetRunCount() const {
+        return Read([this] { return mRun; });
+    }
+    int GetRefusedCount() const {
+        return Read([this] { return mRefused; });
+    } // by a derived queue
+    int GetWaitCount() const {
+        return Read([this] { return mWaits; });
+    }
 
 protected:
     // Whether a task is accepted; ordinal counts the tasks offered, from 1. Called under the lock.
     virtual bool Accepts(int ordinal, ITask* task);
 
 private:
-    struct Counts {
-        int offered = 0;
-        int posted = 0;
-        int null = 0;
-        int run = 0;
-        int refused = 0;
-        int waits = 0;
-    };
-
+    template <class Value>
+    int Read(Value const& value) const {
+        std::lock_guard<std::mutex> lock(mMutex);
+        return value();
+    }
     std::unique_ptr<ITask> TakeFirst();
-    int Count(int Counts::*counter) const;
 
     std::mutex mutable mMutex;
     std::deque<std::unique_ptr<ITask>> mTasks;
-    Counts mCounts;
+    int mOffered = 0;
+    int mNull = 0;
+    int mRun = 0;
+    int mRefused = 0;
+    int mWaits = 0;
     std::function<void()> mBeforeRun;
     std::function<void()> mAfterRun;
 };

@@ -27,7 +27,8 @@ private:
 template <class Event>
 std::vector<Event> GetEventsOf() {
     std::vector<Event> result;
-    for (TracedEvent const& event : RendererTrace::GetEvents()) {
+    Access const trace;
+    for (TracedEvent const& event : trace->notes.events) {
         if (auto const* const found = std::get_if<Event>(&event)) result.push_back(*found);
     }
     return result;
@@ -72,7 +73,6 @@ int RendererTrace::CountCalls(std::string const& operation) {
 
 std::vector<TracedDraw> RendererTrace::GetDraws() { return GetEventsOf<TracedDraw>(); }
 std::vector<TracedClear> RendererTrace::GetClears() { return GetEventsOf<TracedClear>(); }
-std::vector<TracedEvent> RendererTrace::GetEvents() { return Access()->notes.events; }
 std::vector<TracedEvent> RendererTrace::TakeEvents() { return std::exchange(Access()->notes.events, {}); }
 
 PipelineState RendererTrace::GetState() {

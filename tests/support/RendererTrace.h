@@ -50,12 +50,11 @@ public:
     static std::vector<std::string> TakeCalls();
     static int CountCalls(std::string const& operation);
 
-    // The draws and the clears, as values, in order; GetEvents() has both in their common order. A draw
-    // without a current program is none, one of no vertices is one.
+    // The draws and the clears, as values, in order. A draw without a current program is none, one of no vertices is
+    // one.
     static std::vector<TracedDraw> GetDraws();
     static std::vector<TracedClear> GetClears();
-    static std::vector<TracedEvent> GetEvents();
-    // The events, which are then forgotten.
+    // Both in their common order, which are then forgotten.
     static std::vector<TracedEvent> TakeEvents();
     // What a draw would find now.
     static PipelineState GetState();

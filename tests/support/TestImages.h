@@ -11,7 +11,6 @@ using Scenes::Picture;
 
 // Opaque; no two pixels of the first 4096 x 4096 are the same, so that a pixel in the wrong place shows.
 Picture MakeGradient(int width, int height);
-Color GetGradientColor(int x, int y);
 
 // Every alpha from 0 to 255, with colours that are valid premultiplied values of it.
 Picture MakeAlphaPattern(int width, int height);

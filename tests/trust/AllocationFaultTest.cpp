@@ -1,15 +1,14 @@
 // Memory runs out at every place where it can, once and for good, in every scenario.
 #include "moka/base/String.h"
 #include "moka/graphics/bitmap/ImageDecoding.h"
+#include "moka/graphics/drawable/MKStrokeDrawable.h"
 #include "moka/graphics/drawable/ShaderManager.h"
 #include "moka/graphics/drawable/Shaders.h"
 #include "moka/graphics/factory/MKGraphicsFactory.h"
-#include "moka/renderer/RendererFactory.h"
+#include "tests/support/Allocation.h"
 #include "tests/support/LogCapture.h"
-#include "tests/support/Queues.h"
-#include "tests/support/RendererTrace.h"
+#include "tests/support/PumpedRenderer.h"
 #include "tests/support/TestFiles.h"
-#include "tests/trust/Faults.h"
 #include "tests/trust/Scenarios.h"
 
 #include <algorithm>
@@ -40,8 +39,9 @@ void Forget() {
 
 // Goes on after a task that threw, as a render thread does. Its own containers, and those of whoever a task calls,
 // never lack memory: among them are the books of the tracing renderer.
-class SurvivingQueue final : public HandPumpedQueue {
+class SurvivingQueue final : public PumpedRenderer {
 public:
+    SurvivingQueue() : PumpedRenderer(kMaxTexture) {}
     bool Post(ITask* task) override {
         Faults::Pause const pause;
         return HandPumpedQueue::Post(task);
@@ -59,31 +59,26 @@ public:
     }
 };
 
-std::string NameOfScenario(::testing::TestParamInfo<Scenario> const& scenario) { return scenario.param.name; }
+std::string NameOfScenario(::testing::TestParamInfo<Scenario> const& scenario) {
+    std::string name = scenario.param.name;
+    std::replace(name.begin(), name.end(), '-', '_');
+    return name;
+}
 
 // Scenarios over the tracing renderer, on one thread that stands for both sides. Programs are counted with the other
 // objects, so a run that balances leaves nothing alive at all.
 class FaultSweep : public ::testing::TestWithParam<Scenario> {
 protected:
-    static constexpr int kMaxSide = 64;
-
     void SetUp() override {
+        Faults::AcceptLeaks();
         SetLogSink([](LogLine const&) {}); // error lines are expected
         MKBitmapFactory_UseNativeDecoder();
         ASSERT_TRUE(SaveImage(MakeAlphaPattern(20, 90), folder.Path("picture.png")));
-        RendererTrace::Reset();
-        RendererTrace::SetMaxTextureSize(kMaxSide);
-        ASSERT_TRUE(RendererFactory::AttachContext());
-        RendererTrace::DeclareNoRenderThread();
-        queue.SetAroundRun([] { RendererTrace::DeclareRenderThread(); },
-                           [] { RendererTrace::DeclareNoRenderThread(); });
         RunScenario(); // whatever is made once and kept is made now
     }
     void TearDown() override {
         for (std::string const& violation : RendererTrace::GetViolations()) ADD_FAILURE() << violation;
         ForgetShaders(); // those that a leaked drawable holds die with the renderer's next reset
-        RendererTrace::DeclareRenderThread();
-        RendererFactory::DetachContext();
         for (std::string const& name : folder.List())
             EXPECT_EQ(name.find(".tmp"), std::string::npos) << "a save left its temporary file " << name;
         SetLogSink({});
@@ -94,7 +89,7 @@ protected:
         Forget<MKRectShader, MKLineShader, MKCircleShader, MKRoundRectShader, MKRoundRectRoundShader,
                MKBitmapShader, MKBitmapShaderColorClamp, MKBitmapAdvancedBlendingShader,
                MKBlenderBitmapsShader, MKGaussianBlurShader, MKNonPremultipliedColorShader,
-               MKTextMaskBitmapShader>();
+               MKTextMaskBitmapShader, MKStrokeShader>();
     }
     // To its end, or until a call of the library throws for want of memory, and until nothing is posted any more.
     void RunScenario() {
@@ -111,7 +106,7 @@ protected:
         std::vector<std::string> frame = RendererTrace::TakeCalls();
         for (std::string& call : frame) call = WithoutNumbers(call);
         // Of two threads' calls no order is certain.
-        if (GetParam().name == GetLoaderScenario().name) std::sort(frame.begin(), frame.end());
+        if (GetParam().name == "LoadAndSaveInBackground") std::sort(frame.begin(), frame.end());
         return frame;
     }
 
@@ -127,7 +122,8 @@ protected:
                 check(k <= count);
                 ASSERT_EQ(TakeFrame(), undisturbed);
             }
-        RecordProperty("faults", 2 * (count + 1));
+        mFaults += 2 * (count + 1);
+        RecordProperty("faults", mFaults);
         EXPECT_GT(count, 0);
     }
     template <class Check>
@@ -143,33 +139,28 @@ protected:
 
     SurvivingQueue queue;
     TempFolder const folder;
+
+private:
+    int mFaults = 0;
 };
 
 class AllocationFaults : public FaultSweep {};
 
-TEST_P(AllocationFaults, AnObjectThatCannotBeMadeLeavesNothingBehind) {
-    int const alive = RendererTrace::CountLiveObjects();
-    auto const objects = Faults::CountLive(Faults::Kind::Objects);
-    SweepAllocations(Faults::Kind::Objects, [&](bool) {
-        EXPECT_EQ(RendererTrace::CountLiveObjects(), alive);
-        EXPECT_EQ(Faults::CountLive(Faults::Kind::Objects), objects);
-        // A class that memory ran out for has no shader from then on: its drawables draw nothing
-        // until the process ends. For the sweep it ends here, where no shader is in use.
-        ForgetShaders();
-    });
-}
-
-// The copies of what the caller gave, and the loader's books: a call that lacks memory for them did not happen, or
-// throws.
-TEST_P(AllocationFaults, ACallWithoutMemoryForItsCopiesLeavesNothingBehind) {
+// Objects; and the copies of what the caller gave, and the loader's books: a call that lacks memory for them did not
+// happen, or throws.
+TEST_P(AllocationFaults, ACallWithoutMemoryLeavesNothingBehind) {
     int const alive = RendererTrace::CountLiveObjects();
     auto const objects = Faults::CountLive(Faults::Kind::Objects);
     auto const tasks = Faults::CountLive(Faults::Kind::Tasks);
-    SweepAllocations(Faults::Kind::Throwing, [&](bool) {
-        EXPECT_EQ(RendererTrace::CountLiveObjects(), alive);
-        EXPECT_EQ(Faults::CountLive(Faults::Kind::Objects), objects);
-        EXPECT_EQ(Faults::CountLive(Faults::Kind::Tasks), tasks);
-    });
+    for (Faults::Kind const kind : {Faults::Kind::Objects, Faults::Kind::Throwing})
+        SweepAllocations(kind, [&](bool) {
+            EXPECT_EQ(RendererTrace::CountLiveObjects(), alive);
+            EXPECT_EQ(Faults::CountLive(Faults::Kind::Objects), objects);
+            EXPECT_EQ(Faults::CountLive(Faults::Kind::Tasks), tasks);
+            // A class that memory ran out for has no shader from then on: its drawables draw nothing
+            // until the process ends. For the sweep it ends here, where no shader is in use.
+            ForgetShaders();
+        });
 }
 
 // Of renderer objects: all but programs, which FailCreation does not count.
@@ -217,6 +208,7 @@ TEST_P(RequestFaults, ARequestThatCannotBeMadeIsARefusedOne) {
 // Callers rely on this leak, which no other test shows.
 TEST(FileWithoutAQueue, LosesItsDecodedPixels) {
     LogCapture const log;
+    Faults::AcceptLeaks();
     MKBitmapFactory_UseNativeDecoder();
     TempFolder const folder;
     String const path(folder.Path("a.mki"));
@@ -226,10 +218,19 @@ TEST(FileWithoutAQueue, LosesItsDecodedPixels) {
     EXPECT_EQ(Faults::CountLive(Faults::Kind::Objects), objects + 1);
 }
 
-INSTANTIATE_TEST_SUITE_P(Of, AllocationFaults, ::testing::ValuesIn(GetScenarios()), NameOfScenario);
-INSTANTIATE_TEST_SUITE_P(OfTheLoader, AllocationFaults, ::testing::Values(GetLoaderScenario()),
-                         NameOfScenario);
-INSTANTIATE_TEST_SUITE_P(Of, RequestFaults, ::testing::ValuesIn(GetScenarios()), NameOfScenario);
+// Few enough requests for each to fail in turn, and each kind of drawing, clip and bitmap.
+std::vector<Scenario> FindSwept() {
+    return FindScenarios({"CreateAndRead", "CloneAndShare", "LendToForeignCode", "LoadAndSave", "rect-styles",
+                          "round-rect-radii", "circle-styles", "line-caps", "simple-lines", "bitmap-whole",
+                          "bitmap-batch", "bitmap-tall", "clip-clear", "clip-primitives", "save-restore",
+                          "screen", "cross-fade", "gaussian-blur", "non-premultiplied"});
+}
+
+INSTANTIATE_TEST_SUITE_P(Of, AllocationFaults, ::testing::ValuesIn(FindSwept()), NameOfScenario);
+INSTANTIATE_TEST_SUITE_P(
+    OfManyRequests, AllocationFaults,
+    ::testing::ValuesIn(FindScenarios({"strokes", "text-mask", "LoadAndSaveInBackground"})), NameOfScenario);
+INSTANTIATE_TEST_SUITE_P(Of, RequestFaults, ::testing::ValuesIn(FindSwept()), NameOfScenario);
 
 } // namespace
 } // namespace Moka::Testing

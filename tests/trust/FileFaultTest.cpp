@@ -19,66 +19,44 @@
 namespace Moka::Testing {
 namespace {
 
-// Makes file operations of the process fail or fall short, in the libraries under test too. Thread: one.
-class FileFaults {
-public:
-    enum class Mode {
-        Fail,     // the k-th call fails with the error
-        FailAll,  // all from the k-th on do
-        Short,    // every read or write does at most 7 bytes, and is interrupted every third time
-        Truncate, // all reads from the k-th on find the end of the file
-    };
-
-    static void Arm(Mode mode, int k, int error);
-    // How many calls there were since.
-    static int Disarm();
-    // Their names, in order: "open write fsync close ".
-    static std::string const& GetCalls();
+enum class Mode {
+    Fail,     // the k-th call fails with the error
+    FailAll,  // all from the k-th on do
+    Short,    // every read or write does at most 7 bytes, and is interrupted every third time
+    Truncate, // all reads from the k-th on find the end of the file
 };
-
 constexpr std::size_t kMost = 7;
 
+// Makes file operations of the process fail or fall short, in the libraries under test too. Thread: one.
 struct {
     bool isArmed = false;
-    FileFaults::Mode mode = FileFaults::Mode::Fail;
+    Mode mode = Mode::Fail;
     int first = 0;
     int error = 0;
     int count = 0;
-    std::string calls;
+    std::string calls; // "open write fsync close "
 } sweep;
+
+bool Is(Mode mode) { return sweep.isArmed && sweep.mode == mode; }
 
 bool Fails(char const* call) {
     if (!sweep.isArmed) return false;
     int const ordinal = ++sweep.count;
     sweep.calls.append(call).append(" ");
-    bool const fails = (sweep.mode == FileFaults::Mode::Fail && ordinal == sweep.first) ||
-                       (sweep.mode == FileFaults::Mode::FailAll && ordinal >= sweep.first);
+    bool const fails =
+        (Is(Mode::Fail) && ordinal == sweep.first) || (Is(Mode::FailAll) && ordinal >= sweep.first);
     if (fails) errno = sweep.error;
     return fails;
 }
 
 bool IsInterrupted() {
-    if (!sweep.isArmed || sweep.mode != FileFaults::Mode::Short || sweep.count % 3 != 0) return false;
+    if (!Is(Mode::Short) || sweep.count % 3 != 0) return false;
     errno = EINTR;
     return true;
 }
 
-std::size_t Cut(std::size_t count) {
-    return sweep.isArmed && sweep.mode == FileFaults::Mode::Short ? std::min(count, kMost) : count;
-}
-
-bool IsAtEnd() {
-    return sweep.isArmed && sweep.mode == FileFaults::Mode::Truncate && sweep.count >= sweep.first;
-}
-
-void FileFaults::Arm(Mode mode, int k, int error) { sweep = {true, mode, k, error, 0, {}}; }
-
-int FileFaults::Disarm() {
-    sweep.isArmed = false;
-    return sweep.count;
-}
-
-std::string const& FileFaults::GetCalls() { return sweep.calls; }
+std::size_t Cut(std::size_t count) { return Is(Mode::Short) ? std::min(count, kMost) : count; }
+bool IsAtEnd() { return Is(Mode::Truncate) && sweep.count >= sweep.first; }
 
 } // namespace
 } // namespace Moka::Testing
@@ -139,7 +117,6 @@ MOKA_INTERPOSED off_t lseek(int file, off_t offset, int whence) noexcept {
 namespace Moka::Testing {
 namespace {
 
-using Mode = FileFaults::Mode;
 constexpr Mode kFailing[] = {Mode::Fail, Mode::FailAll};
 constexpr int kErrors[] = {ENOSPC, EACCES, EIO};
 
@@ -152,9 +129,10 @@ protected:
     bool IsAlone() const { return mFolder.List().size() == 1; }
     template <class Action>
     static int Disturb(Mode mode, int k, int error, Action const& action) {
-        FileFaults::Arm(mode, k, error);
+        sweep = {true, mode, k, error, 0, {}};
         action();
-        return FileFaults::Disarm();
+        sweep.isArmed = false;
+        return sweep.count;
     }
 
     // Large enough for several blocks of any codec.
@@ -175,7 +153,7 @@ TEST_P(FileFault, ASaveShowsTheOldFileOrTheWholeNewOne) {
     int const count = Disturb(Mode::Fail, 0, 0, [&] { ASSERT_TRUE(Save(mNew)); });
     ASSERT_GE(count, 5); // made, written, flushed, closed, renamed
     // The file is on the disk before it takes the name, and the folder after.
-    EXPECT_THAT(FileFaults::GetCalls(), ::testing::EndsWith(" fsync close rename open fsync close "));
+    EXPECT_THAT(sweep.calls, ::testing::EndsWith(" fsync close rename open fsync close "));
     int failures = 0;
     for (Mode const mode : kFailing)
         for (int const error : kErrors)

@@ -1,66 +1,58 @@
 // A queue that refuses at random. It does itself what a refused task was to do, so that nothing may be left, and
 // what somebody else has done in the task's place shows as done twice.
-#include "moka/renderer/RendererFactory.h"
+#include "tests/support/Allocation.h"
 #include "tests/support/LogCapture.h"
-#include "tests/support/Queues.h"
-#include "tests/support/RendererTrace.h"
-#include "tests/trust/Faults.h"
-#include "tests/trust/MixedWork.h"
+#include "tests/support/PumpedRenderer.h"
+#include "tests/support/TestFiles.h"
+#include "tests/trust/Scenarios.h"
 
 #include <gtest/gtest.h>
-#include <random>
 #include <set>
-#include <string>
 #include <typeinfo>
 
 namespace Moka::Testing {
 namespace {
 
-constexpr std::int64_t kPosts = 60000;
-constexpr std::int64_t kPostsBetweenLooks = 20000;
+constexpr int kRuns = 480;
+constexpr int kRunsBetweenLooks = 160;
 
 // Thread: one, which stands for both sides.
-class UnreliableQueue final : public IGLMsgQueue {
+class UnreliableQueue final : public PumpedRenderer {
 public:
-    UnreliableQueue(unsigned seed, int percent) : mRandom(seed), mPercent(percent) {}
+    explicit UnreliableQueue(int percent) : PumpedRenderer(kMaxTexture), mPercent(percent) {}
 
     // A task posted by a task is accepted: those that wait may come before it only in part.
     bool Post(ITask* task) override {
-        if (mIsRunning || static_cast<int>(mRandom() % 100) >= mPercent) return mTasks.Post(task);
+        if (mIsRunning || static_cast<int>(mRandom() % 100) >= mPercent) return HandPumpedQueue::Post(task);
         std::string const kind = typeid(*task).name();
+        bool const hasVector = kind.find("vector") != std::string::npos;
         // The caller frees the rectangles of a refused batch, but not the reference for it.
-        if (kind.find("RectF") != std::string::npos && kind.find("vector") != std::string::npos)
-            return mTasks.Post(task);
+        if (hasVector && kind.find("RectF") != std::string::npos) return HandPumpedQueue::Post(task);
         ++refused;
         kinds.insert(kind);
-        RunAll();
-        if (kind.find("vector") == std::string::npos) Run([task] { task->run(); });
-        RunAll();
+        Drain();
+        if (!hasVector) {
+            RendererTrace::DeclareRenderThread();
+            mIsRunning = true;
+            task->run();
+            mIsRunning = false;
+            RendererTrace::DeclareNoRenderThread();
+        }
+        Drain();
         return false;
     }
-    void WaitForTasks() override { RunAll(); }
-
-    void RunAll() {
-        Run([this] { mTasks.RunAll(); });
-    }
-    HandPumpedQueue const& GetTasks() const { return mTasks; }
-
-    std::int64_t refused = 0;
-    std::set<std::string> kinds;
-
-private:
-    template <class Action>
-    void Run(Action const& action) {
-        if (mIsRunning) return;
-        mIsRunning = true;
-        RendererTrace::DeclareRenderThread();
-        action();
-        RendererTrace::DeclareNoRenderThread();
+    void WaitForTasks() override { Drain(); }
+    void Drain() {
+        if (std::exchange(mIsRunning, true)) return;
+        RunAll();
         mIsRunning = false;
     }
 
-    HandPumpedQueue mTasks;
-    std::mt19937 mRandom;
+    int refused = 0;
+    std::set<std::string> kinds;
+
+private:
+    std::mt19937 mRandom{7};
     int const mPercent;
     bool mIsRunning = false;
 };
@@ -68,40 +60,34 @@ private:
 class RefusingQueueTest : public ::testing::TestWithParam<int> {};
 
 TEST_P(RefusingQueueTest, WhatRefusedTasksWereToDoIsAllThatIsLeftBehind) {
-    RendererTrace::Reset();
+    TempFolder const folder;
+    ASSERT_TRUE(SaveImage(MakeAlphaPattern(20, 90), folder.Path("picture.png")));
+    UnreliableQueue queue(GetParam());
     RendererTrace::KeepRecords(false);
-    RendererTrace::SetMaxTextureSize(MixedWork::kSide);
-    ASSERT_TRUE(RendererFactory::AttachContext());
-    RendererTrace::DeclareNoRenderThread();
-    UnreliableQueue queue(7, GetParam());
-    LogCapture log;
+    SetLogSink([](LogLine const&) {}); // each refusal is reported
+    std::mt19937 random(11);
+    Stage const stage{queue,
+                      [&] {
+                          if (random() % 2 == 0) queue.Drain();
+                      },
+                      folder.GetPath()};
+    GetScenarios(); // which are made once and kept
     auto const objects = Faults::CountLive(Faults::Kind::Objects);
     auto const tasks = Faults::CountLive(Faults::Kind::Tasks);
-    auto const countOffered = [&] { return queue.GetTasks().GetPostedCount() + queue.refused; };
-    {
-        MixedWork work(queue, 11, nullptr);
-        while (countOffered() < kPosts && !HasFailure()) {
-            std::int64_t const end = countOffered() + kPostsBetweenLooks;
-            while (countOffered() < end) {
-                work.Step();
-                if (countOffered() % 3 == 0) queue.RunAll();
-                log.Clear();
-            }
-            work.DropAll();
-            queue.RunAll();
-            EXPECT_EQ(RendererTrace::CountLiveObjects(), 0);
-            EXPECT_EQ(Faults::CountLive(Faults::Kind::Objects), objects);
-            EXPECT_EQ(Faults::CountLive(Faults::Kind::Tasks), tasks);
-        }
+    for (int i = 1; i <= kRuns && !HasFailure(); ++i) {
+        RunAnyScenario(stage, random);
+        if (i % kRunsBetweenLooks != 0) continue;
+        queue.Drain();
+        EXPECT_EQ(RendererTrace::CountLiveObjects(), 0);
+        EXPECT_EQ(Faults::CountLive(Faults::Kind::Objects), objects);
+        EXPECT_EQ(Faults::CountLive(Faults::Kind::Tasks), tasks);
     }
-    EXPECT_EQ(queue.GetTasks().GetPostedCount(), queue.GetTasks().GetRunCount());
-    EXPECT_EQ(queue.GetTasks().GetNullCount(), 0);
-    EXPECT_EQ(Faults::CountWrongFrees(), 0);
-    EXPECT_GE(queue.kinds.size(), 25u); // the work is mixed
+    SetLogSink({});
+    EXPECT_EQ(queue.GetPostedCount(), queue.GetRunCount());
+    EXPECT_EQ(queue.GetNullCount(), 0);
+    EXPECT_GE(queue.kinds.size(), 20u); // the work is mixed
     for (std::string const& violation : RendererTrace::GetViolations()) ADD_FAILURE() << violation;
-    RecordProperty("refused", static_cast<int>(queue.refused));
-    RendererTrace::DeclareRenderThread();
-    RendererFactory::DetachContext();
+    RecordProperty("refused", queue.refused);
 }
 
 INSTANTIATE_TEST_SUITE_P(PerCent, RefusingQueueTest, ::testing::Values(1, 10, 50));

@@ -1,29 +1,20 @@
 #include "tests/trust/Scenarios.h"
 
 #include "moka/base/MessageLoop.h"
-#include "moka/base/RefPtr.h"
-#include "moka/base/String.h"
 #include "moka/graphics/bitmap/IMKSubBitmap.h"
 #include "moka/graphics/bitmap/IMKTextureBitmap.h"
-#include "moka/graphics/canvas/IMKCanvas.h"
-#include "moka/graphics/canvas/IMKPenCanvas.h"
-#include "moka/graphics/drawable/MKBlendedBitmapDrawable.h"
-#include "moka/graphics/drawable/MKGaussianBlurDrawable.h"
-#include "moka/graphics/drawable/MKNonPremultipliedColorDrawable.h"
-#include "moka/graphics/drawable/MKTextMaskBitmapDrawable.h"
-#include "moka/graphics/factory/MKGraphicsFactory.h"
+#include "moka/graphics/factory/BitmapsAndCanvases.h"
 #include "moka/graphics/loader/BitmapLoader.h"
 #include "moka/graphics/loader/MKBitmapLoader.h"
 #include "moka/graphics/loader/MKBitmapSaveManager.h"
 #include "scenes/SceneError.h"
-#include "scenes/SceneFile.h"
 #include "scenes/SceneRenderer.h"
 #include "tests/support/TestFiles.h"
 
+#include <algorithm>
 #include <atomic>
 #include <chrono>
-#include <memory>
-#include <new>
+#include <iterator>
 #include <thread>
 
 namespace Moka::Testing {
@@ -31,17 +22,17 @@ namespace {
 
 using BitmapPtr = RefPtr<IMKBitmap>;
 
-constexpr int kWidth = 24;
-constexpr int kHeight = 100; // several strips, where a texture has 64 rows
+constexpr int kWidth = 4;
+constexpr int kHeight = 2 * kMaxTexture; // strips
+constexpr int kSide = 20;
 
 Picture const& GetImage() {
     static Picture const image = MakeAlphaPattern(kWidth, kHeight);
     return image;
 }
 
-BitmapPtr MakeBitmap(Stage const& stage, int height = kHeight) {
-    return BitmapPtr::Adopt(MKGraphicsFactory::CreateBitmap(&stage.queue, kWidth, height,
-                                                            GetImage().pixels.data(), false, 1, false));
+BitmapPtr MakeBitmap(Stage const& stage) {
+    return NewBitmap(stage.queue, kWidth, kHeight, GetImage().pixels.data());
 }
 
 void CreateAndRead(Stage const& stage) {
@@ -50,65 +41,29 @@ void CreateAndRead(Stage const& stage) {
     bitmap->SetTag("picture");
     bitmap->GetTextureBitmap()->UpdateBitmap(GetImage().pixels.data(), kWidth * 4);
     bitmap->GetPixel(Point(3, 3));
+    bitmap->GetPixelAsync(Point(1, 1), nullptr, nullptr);
 }
 
 void CloneAndShare(Stage const& stage) {
-    BitmapPtr bitmap = MakeBitmap(stage);
+    BitmapPtr bitmap = stage.shared ? BitmapPtr::Share(stage.shared) : MakeBitmap(stage);
     if (!bitmap) return;
     auto const clone = BitmapPtr::Adopt(bitmap->Clone());
-    auto const shared = BitmapPtr::Adopt(MKGraphicsFactory::CreateBitmap(&stage.queue, bitmap.Get(), 1));
+    auto const shared = NewSharedBitmap(stage.queue, bitmap);
+    auto const canvas = NewCanvas(stage.queue, clone);
     if (IMKSubBitmap* const strip = bitmap->GetTextureBitmap()->GetSubBitmap(0))
         RefPtr<IMKSubBitmap>::Adopt(strip->Clone());
+    if (canvas) canvas->DrawBitmap(shared.Get(), 1, 1, nullptr);
     bitmap = {};
     stage.settle();
     if (clone) clone->GetPixel(Point(1, 1));
-    auto const screen =
-        BitmapPtr::Adopt(MKGraphicsFactory::CreateScreenBitmap(&stage.queue, 0, 0, kWidth, kHeight, 1, 1));
+    auto const screen = NewScreenBitmap(stage.queue, kSide, kSide);
     if (!screen) return;
     screen->GetPixel(Point(1, 1));
     auto const other = BitmapPtr::Adopt(screen->Clone());
 }
 
-// The drawable that make creates for a bitmap, drawn on another one.
-template <class Make>
-void DrawCustom(Stage const& stage, Make const& make) {
-    BitmapPtr const source = MakeBitmap(stage, 50);
-    BitmapPtr const target = MakeBitmap(stage);
-    if (!source || !target) return;
-    auto const canvas =
-        RefPtr<IMKCanvas>::Adopt(MKGraphicsFactory::CreateCanvas(&stage.queue, target.Get(), 1));
-    auto const drawable = RefPtr<IMKCustomDrawable>::Adopt(make(source.Get()));
-    if (canvas && drawable) canvas->Draw(drawable.Get(), nullptr);
-    stage.settle();
-}
-
-template <class Drawable, class... Bitmaps>
-void DrawCustomOf(Stage const& stage) {
-    DrawCustom(stage, [&](IMKBitmap* source) {
-        auto* const drawable = new (std::nothrow) Drawable(&stage.queue);
-        if (drawable) drawable->SetBitmap(static_cast<Bitmaps*>(source)...);
-        return drawable;
-    });
-}
-
-void BlendTwoBitmaps(Stage const& stage) {
-    DrawCustom(stage, [&](IMKBitmap* source) {
-        RectF const whole(0, 0, 24, 50);
-        BitmapPtr first = BitmapPtr::Share(source);
-        BitmapPtr second = first;
-        auto* const blend =
-            new (std::nothrow) MKBlendedBitmapDrawable(&stage.queue, source, source, whole, whole, 0, 0);
-        // The drawable has taken over these two references.
-        if (blend) static_cast<void>(first.Release()), static_cast<void>(second.Release());
-        return blend;
-    });
-}
-
 void LendToForeignCode(Stage const& stage) {
-    BitmapPtr const target = MakeBitmap(stage, 50);
-    if (!target) return;
-    auto const canvas =
-        RefPtr<IMKPenCanvas>::Adopt(MKGraphicsFactory::CreatePenCanvas(&stage.queue, target.Get(), 1));
+    auto const canvas = NewPenCanvas(stage.queue, MakeBitmap(stage));
     if (!canvas) return;
     canvas->SetClipRect(1, 1, 10, 20, IMKCanvasBase::Intersect);
     canvas->Clear(0x40FF0000);
@@ -124,20 +79,23 @@ void LoadAndSave(Stage const& stage) {
         BitmapPtr::Adopt(MKGraphicsFactory::CreateBitmap(&stage.queue, Rect(2, 2, 9, 70), &path, 1));
     stage.settle();
     for (char const* const name : {"/saved.png", "/saved.jpg", "/saved.webp", "/saved.mki"})
-        static_cast<void>(SaveImage(GetImage(), stage.folder + name, 80));
+        static_cast<void>(SaveImage(MakeAlphaPattern(24, 20), stage.folder + name, 80));
 }
-
-constexpr int kSide = 20;
 
 // Counts the accepted requests and the callbacks, which it waits for.
 class Book {
 public:
+    explicit Book(std::function<void(IMKBitmap&)> onLoad) : mOnLoad(std::move(onLoad)) {}
+
     void Expect(bool isAccepted) { mExpected += isAccepted ? 1 : 0; }
 
     template <class Loader>
     typename Loader::Callback MakeCallback() {
         typename Loader::Callback callback;
-        callback.onLoad = [this](int, String const&, auto&) { ++mCalled; };
+        callback.onLoad = [this](int, String const&, auto& loaded) {
+            if constexpr (std::is_same_v<Loader, MKBitmapLoader>) mOnLoad(loaded);
+            ++mCalled;
+        };
         callback.onLoadError = [this](int, String const&) { ++mCalled; };
         callback.onSave = [this](int, String const&, void*) { ++mCalled; };
         callback.onSaveError = [this](int, String const&, void*) { ++mCalled; };
@@ -151,24 +109,19 @@ public:
     }
 
 private:
+    std::function<void(IMKBitmap&)> const mOnLoad;
     int mExpected = 0;
     std::atomic<int> mCalled{0};
 };
 
 // Waits, however the scenario ends, until the loader has nothing in hand: a load that was cancelled on the way out
 // may still be decoded.
-class LoaderAtRest {
-public:
-    explicit LoaderAtRest(Stage const& stage) : mStage(stage) {}
+struct LoaderAtRest {
     ~LoaderAtRest() {
-        MKBitmapLoader::WaitForAllSaveRequestsToEnd(&mStage.queue);
-        mStage.settle();
+        MKBitmapLoader::WaitForAllSaveRequestsToEnd(&stage.queue);
+        stage.settle();
     }
-    LoaderAtRest(LoaderAtRest const&) = delete;
-    LoaderAtRest& operator=(LoaderAtRest const&) = delete;
-
-private:
-    Stage const& mStage;
+    Stage const& stage;
 };
 
 void SavePixels(BitmapLoader& loader, Book& book, String const& path) {
@@ -189,16 +142,19 @@ void SaveManaged(Stage const& stage, IMKBitmap& bitmap, String const& path) {
 
 void LoadAndSaveInBackground(Stage const& stage) {
     if (!MKBitmapLoader::startEventLoopBySelf()) return;
-    LoaderAtRest const atRest(stage);
+    LoaderAtRest const atRest{stage};
     String const picture(stage.folder + "/picture.png");
     String const saved(stage.folder + "/saved.png");
-    Book book;
+    BitmapPtr const bitmap = NewBitmap(stage.queue, kSide, kSide);
+    auto const canvas =
+        stage.shared ? NewCanvas(stage.queue, BitmapPtr::Share(stage.shared)) : RefPtr<IMKCanvas>();
+    Book book([&](IMKBitmap& loaded) {
+        if (canvas) canvas->DrawBitmap(&loaded, 0, 0, nullptr);
+    });
     auto gpuCallback = book.MakeCallback<MKBitmapLoader>();
     auto cpuCallback = book.MakeCallback<BitmapLoader>();
     MKBitmapLoader gpu("gpu", &gpuCallback);
     BitmapLoader cpu("cpu", &cpuCallback);
-    auto const bitmap = RefPtr<IMKBitmap>::Adopt(
-        MKGraphicsFactory::CreateBitmap(&stage.queue, kSide, kSide, nullptr, false, 1, false));
     book.Expect(gpu.RequestLoad(1, picture, &stage.queue));
     book.Expect(cpu.RequestLoad(1, picture, &stage.queue, 7, 9));
     book.Expect(gpu.RequestLoad(2, String(stage.folder + "/missing.png"), &stage.queue));
@@ -208,11 +164,8 @@ void LoadAndSaveInBackground(Stage const& stage) {
     if (bitmap) SaveManaged(stage, *bitmap, saved);
 }
 
-// Reading it anew is no part of what is swept.
-Scenario MakeDrawing(std::string const& name, bool onScreen) {
-    Scenes::Scene scene = Scenes::LoadScene(std::string(MOKA_TRUST_SCENES) + "/" + name + ".json");
-    scene.onScreen = onScreen;
-    return {"Draws_" + name + (onScreen ? "_on_screen" : ""), [scene](Stage const& stage) {
+Scenario MakeDrawing(Scenes::Scene const& scene) {
+    return {scene.name, [&scene](Stage const& stage) {
                 try {
                     RenderScene(scene, stage.queue);
                 } catch (Scenes::SceneError const&) {
@@ -220,26 +173,35 @@ Scenario MakeDrawing(std::string const& name, bool onScreen) {
             }};
 }
 
-} // namespace
-
-std::vector<Scenario> GetScenarios() {
-    std::vector<Scenario> scenarios = {
-        {"CreateAndRead", CreateAndRead},
-        {"CloneAndShare", CloneAndShare},
-        {"DrawBlur", DrawCustomOf<MKGaussianBlurDrawable, IMKBitmap>},
-        {"DrawMask", DrawCustomOf<MKTextMaskBitmapDrawable, IMKBitmap>},
-        {"DrawStraight", DrawCustomOf<MKNonPremultipliedColorDrawable, IMKBitmap, IMKBitmap>},
-        {"BlendTwoBitmaps", BlendTwoBitmaps},
-        {"LendToForeignCode", LendToForeignCode},
-        {"LoadAndSave", LoadAndSave},
-        MakeDrawing("clips", true),
-    };
-    for (char const* const name :
-         {"lines", "rectangles", "circles", "bitmaps", "clips", "turned_clips", "levels"})
-        scenarios.push_back(MakeDrawing(name, false));
+std::vector<Scenario> MakeScenarios() {
+    std::vector<Scenario> scenarios = {{"CreateAndRead", CreateAndRead},
+                                       {"CloneAndShare", CloneAndShare},
+                                       {"LendToForeignCode", LendToForeignCode},
+                                       {"LoadAndSave", LoadAndSave}};
+    for (Scenes::Scene const& scene : Scenes::GetScenes())
+        if (!scene.needsPen && std::max(scene.width, scene.height / 2) <= kMaxTexture)
+            scenarios.push_back(MakeDrawing(scene));
+    scenarios.push_back({"LoadAndSaveInBackground", LoadAndSaveInBackground});
     return scenarios;
 }
 
-Scenario GetLoaderScenario() { return {"LoadAndSaveInBackground", LoadAndSaveInBackground}; }
+} // namespace
+
+std::vector<Scenario> const& GetScenarios() {
+    static std::vector<Scenario> const scenarios = MakeScenarios();
+    return scenarios;
+}
+
+std::vector<Scenario> FindScenarios(std::vector<std::string> const& names) {
+    std::vector<Scenario> found;
+    std::copy_if(
+        GetScenarios().begin(), GetScenarios().end(), std::back_inserter(found),
+        [&](auto& scenario) { return std::find(names.begin(), names.end(), scenario.name) != names.end(); });
+    return found;
+}
+
+void RunAnyScenario(Stage const& stage, std::mt19937& random) {
+    GetScenarios()[random() % (GetScenarios().size() - 1)].run(stage);
+}
 
 } // namespace Moka::Testing

@@ -1,10 +1,12 @@
 // Scenarios: what callers do with the library, each from nothing to nothing. The sweeps run them with one
-// thing after another failing, so each takes null for an answer.
+// thing after another failing, so each takes null for an answer; others run them in an order drawn at random.
 #pragma once
 
+#include "moka/graphics/bitmap/IMKBitmap.h"
 #include "moka/graphics/task/IGLMsgQueue.h"
 
 #include <functional>
+#include <random>
 #include <string>
 #include <vector>
 
@@ -15,6 +17,7 @@ struct Stage {
     IGLMsgQueue& queue;
     std::function<void()> settle; // until everything posted so far has run
     std::string folder;           // for files, without a slash; "picture.png" lies there
+    IMKBitmap* shared = nullptr;  // drawn and cloned by several callers at once, where there is one
 };
 
 struct Scenario {
@@ -22,11 +25,15 @@ struct Scenario {
     std::function<void(Stage const&)> run;
 };
 
-// One for each file of tests/trust/scenes, which is drawn and read back, and what no scene says.
-std::vector<Scenario> GetScenarios();
+// The largest texture with which every scene has room, and the tall bitmaps of the others have strips.
+constexpr int kMaxTexture = 640;
 
-// Loads and saves with the loader. Not among the others, since it waits for every callback, and a save whose
-// read-back is refused calls nobody, as callers know.
-Scenario GetLoaderScenario();
+// The registry's scenes, those that take much time or a pen aside, and what no scene says. The last one loads, draws and
+// saves with the loader, and waits for every callback: a save whose read-back is refused calls nobody.
+std::vector<Scenario> const& GetScenarios();
+std::vector<Scenario> FindScenarios(std::vector<std::string> const& names);
+
+// Any but the last.
+void RunAnyScenario(Stage const& stage, std::mt19937& random);
 
 } // namespace Moka::Testing

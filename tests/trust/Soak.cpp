@@ -1,15 +1,21 @@
-// Works with the library for as many operations as the argument says, and fails when memory or renderer
+// Works with the library until as many tasks were posted as the argument says, and fails when memory or renderer
 // objects grow after the first fifth.
-#include "moka/base/RefPtr.h"
 #include "moka/base/log/LogSink.h"
+#include "moka/graphics/bitmap/ImageDecoding.h"
 #include "moka/graphics/drawable/MKBlendedBitmapDrawable.h"
 #include "moka/graphics/drawable/MKGaussianBlurDrawable.h"
+#include "moka/graphics/drawable/MKNonPremultipliedColorDrawable.h"
+#include "moka/graphics/drawable/MKStrokeDrawable.h"
 #include "moka/graphics/drawable/MKTextMaskBitmapDrawable.h"
+#include "moka/graphics/factory/BitmapsAndCanvases.h"
 #include "moka/host/RenderThread.h"
 #include "moka/renderer/RendererFactory.h"
-#include "tests/trust/MixedWork.h"
+#include "scenes/SceneRenderer.h"
+#include "tests/support/TestFiles.h"
+#include "tests/trust/Scenarios.h"
 
 #include <algorithm>
+#include <atomic>
 #include <cstddef>
 #include <cstdint>
 #include <cstdio>
@@ -30,11 +36,9 @@ constexpr double kMostGrowth = 1024; // bytes for ten thousand operations
 constexpr double kSlack = 128 * 1024;
 constexpr double kShortSlack = 4096 * 1024;
 constexpr std::int64_t kShort = 500000; // operations
-// What may be queued bounds what the pools of tasks and draws keep, whose growth would be no leak.
-constexpr int kCallsBetweenWaits = 100;
 
 struct Sample {
-    double calls;
+    double tasks;
     double bytes; // resident
     double inUse; // of the heap
     int objects;
@@ -54,10 +58,10 @@ double GetResidentBytes() {
 
 std::unique_ptr<IGLMsgQueue> StartRenderThread() {
     RenderThreadOptions options;
-    options.limits.maxTextureSize = MixedWork::kSide;
+    options.limits.maxTextureSize = kMaxTexture;
     options.debugContext = true;
-    options.surfaceWidth = MixedWork::kSide; // the screen bitmaps need a default frame buffer
-    options.surfaceHeight = MixedWork::kSide;
+    options.surfaceWidth = kMaxTexture; // the screen bitmaps need a default frame buffer
+    options.surfaceHeight = kMaxTexture;
     std::string error;
     auto thread = RenderThread::Start(options, &error);
     if (!thread) std::fprintf(stderr, "no render thread: %s\n", error.c_str());
@@ -72,30 +76,37 @@ int CountRendererObjects() {
            s.stateObjects + s.buffers + static_cast<int>(s.errors);
 }
 
-// Works until calls have been made, never far ahead of the render thread.
-void WorkUntil(MixedWork& work, IGLMsgQueue& queue, std::int64_t calls) {
-    std::int64_t nextWait = work.CountCalls() + kCallsBetweenWaits;
-    while (work.CountCalls() < calls) {
-        work.Step();
-        if (work.CountCalls() < nextWait) continue;
-        queue.WaitForTasks();
-        nextWait = work.CountCalls() + kCallsBetweenWaits;
-    }
-}
-
 // What a task drops for good is deleted by a task that it posts, which may drop more.
 void AwaitIdle(IGLMsgQueue& queue) {
     constexpr int kDeepest = 8;
     for (int i = 0; i < kDeepest; ++i) queue.WaitForTasks();
 }
 
-// Bytes for each call: the median of the slopes between any two samples. A leak raises them all; a pool of the
+// Counts what is posted.
+class CountingQueue final : public IGLMsgQueue {
+public:
+    explicit CountingQueue(IGLMsgQueue& queue) : mQueue(queue) {}
+    ~CountingQueue() override { AwaitIdle(mQueue); }
+
+    bool Post(ITask* task) override {
+        ++posted;
+        return mQueue.Post(task);
+    }
+    void WaitForTasks() override { mQueue.WaitForTasks(); }
+
+    std::atomic<std::int64_t> posted{0};
+
+private:
+    IGLMsgQueue& mQueue;
+};
+
+// Bytes for each task: the median of the slopes between any two samples. A leak raises them all; a pool of the
 // driver's that grows once, at whatever time, does not move it.
 double GetSlope(std::vector<Sample> const& samples, double Sample::*value) {
     std::vector<double> slopes;
     for (std::size_t i = kWarmUp; i < samples.size(); ++i)
         for (std::size_t j = i + 1; j < samples.size(); ++j)
-            slopes.push_back((samples[j].*value - samples[i].*value) / (samples[j].calls - samples[i].calls));
+            slopes.push_back((samples[j].*value - samples[i].*value) / (samples[j].tasks - samples[i].tasks));
     auto const middle = slopes.begin() + static_cast<std::ptrdiff_t>(slopes.size() / 2);
     std::nth_element(slopes.begin(), middle, slopes.end());
     return *middle;
@@ -106,21 +117,24 @@ double GetSlope(std::vector<Sample> const& samples, double Sample::*value) {
 class ProgramsInUse {
 public:
     explicit ProgramsInUse(IGLMsgQueue& queue)
-        : mWork(queue, 2, nullptr),
-          mBlur(Made::Adopt(new MKGaussianBlurDrawable(&queue))),
-          mMask(Made::Adopt(new MKTextMaskBitmapDrawable(&queue))),
-          mBlend(Made::Adopt(new MKBlendedBitmapDrawable(&queue, nullptr, nullptr, RectF(), RectF(), 0, 0))) {
-        constexpr int kSteps = 100; // enough for its canvases to have drawn everything
-        for (int i = 0; i < kSteps; ++i) mWork.Step();
+        : mTarget(NewBitmap(queue, kMaxTexture, kMaxTexture)),
+          mCanvas(NewCanvas(queue, mTarget)),
+          mDrawables{Made::Adopt(new MKGaussianBlurDrawable(&queue)),
+                     Made::Adopt(new MKTextMaskBitmapDrawable(&queue)),
+                     Made::Adopt(new MKStrokeDrawable(&queue)),
+                     Made::Adopt(new MKNonPremultipliedColorDrawable(&queue)),
+                     Made::Adopt(new MKBlendedBitmapDrawable(&queue, nullptr, nullptr, {}, {}, 0, 0))} {
+        Scenes::QueueStage stage(queue);
+        for (Scenes::Scene const& scene : Scenes::GetScenes())
+            if (!scene.needsPen) DrawScene(scene, *mCanvas, stage);
     }
 
 private:
     using Made = RefPtr<IMKCustomDrawable>;
 
-    MixedWork mWork;
-    Made mBlur;
-    Made mMask;
-    Made mBlend;
+    RefPtr<IMKBitmap> const mTarget;
+    RefPtr<IMKCanvas> const mCanvas;
+    std::vector<Made> const mDrawables;
 };
 
 // The renderer may keep a copy of a target for the next time, or not.
@@ -133,17 +147,20 @@ int GetMostObjects(std::vector<Sample> const& samples, std::size_t count) {
 int Soak(std::int64_t operations) {
     mallopt(M_ARENA_MAX, 1); // so that the heap's count has every thread's blocks
     SetLogSink([](LogLine const&) {});
-    std::unique_ptr<IGLMsgQueue> const queue = StartRenderThread();
-    if (!queue) return 1;
-    ProgramsInUse const programs(*queue);
-    MixedWork work(*queue, 1, nullptr);
+    std::unique_ptr<IGLMsgQueue> const thread = StartRenderThread();
+    TempFolder const folder;
+    if (!thread || !SaveImage(MakeGradient(20, 90), folder.Path("picture.png"))) return 1;
+    MKBitmapFactory_UseNativeDecoder();
+    CountingQueue queue(*thread);
+    ProgramsInUse const programs(queue);
+    Stage const stage{queue, [&] { queue.WaitForTasks(); }, folder.GetPath()};
+    std::mt19937 random(1);
     std::vector<Sample> samples;
     samples.reserve(kSamples);
     for (std::int64_t i = 1; i <= kSamples; ++i) {
-        WorkUntil(work, *queue, operations * i / kSamples);
-        work.DropAll();
-        AwaitIdle(*queue);
-        samples.push_back({static_cast<double>(work.CountCalls()), GetResidentBytes(),
+        while (queue.posted < operations * i / kSamples) RunAnyScenario(stage, random);
+        AwaitIdle(queue);
+        samples.push_back({static_cast<double>(queue.posted), GetResidentBytes(),
                            static_cast<double>(mallinfo2().uordblks), CountRendererObjects()});
     }
     double const slope = GetSlope(samples, &Sample::bytes) * 10000;
@@ -152,7 +169,7 @@ int Soak(std::int64_t operations) {
     std::printf("operations %lld\nresident %.0f KB after warm-up, %.0f KB at the end\n"
                 "growth for 10,000 operations: resident %.1f bytes, heap in use %.1f bytes\n"
                 "renderer objects at most %d in the warm-up, %d at the end\n",
-                static_cast<long long>(work.CountCalls()), samples[kWarmUp].bytes / 1024,
+                static_cast<long long>(queue.posted), samples[kWarmUp].bytes / 1024,
                 samples.back().bytes / 1024, slope, heapSlope, objects, samples.back().objects);
     double const slack = operations < kShort ? kShortSlack : kSlack;
     bool const isFlat = slope < kMostGrowth || samples.back().bytes - samples[kWarmUp].bytes < slack;

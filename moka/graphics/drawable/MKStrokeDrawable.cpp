@@ -96,6 +96,7 @@ public:
         : mStroke(RefPtr<MKStrokeDrawable>::Share(stroke)), mPoints(std::move(points)) {}
 
     void run() override {
+        if (!mStroke->mStroke) return;
         if (mPoints.empty()) {
             mStroke->mStroke->Clear();
             return;
@@ -116,14 +117,14 @@ private:
 MKStrokeDrawable::MKStrokeDrawable(IGLMsgQueue* queue)
     : CustomDrawable(queue, PrimitiveType::TriangleList, FloatVertex({4, 4, 4, 4, 4, 2})),
       mQueue(queue),
-      mStroke(std::make_unique<StrokeRT>()) {}
+      mStroke(new (std::nothrow) StrokeRT) {}
 
 MKStrokeDrawable::~MKStrokeDrawable() = default;
 
 // Draws read the points; what changes them is posted by the thread that waits here.
 std::vector<MKStrokePoint> MKStrokeDrawable::ReadPoints() {
     if (mQueue) mQueue->WaitForTasks();
-    return mStroke->GetPoints();
+    return mStroke ? mStroke->GetPoints() : std::vector<MKStrokePoint>();
 }
 
 void MKStrokeDrawable::Append(MKStrokePoint const* points, int count) {
@@ -151,7 +152,7 @@ void MKStrokeDrawable::Clear() {
 
 void MKStrokeDrawable::DrawRT(Matrix4<float> const& projection, MKPaint const& paint) {
     RenderTargetSize const target = RendererFactory::GetActiveTargetSize();
-    if (mStroke->IsEmpty() || target.width < 1 || target.height < 1 || !IsConstructed()) return;
+    if (!mStroke || mStroke->IsEmpty() || target.width < 1 || target.height < 1 || !IsConstructed()) return;
     StrokeView const view(projection, target.width, target.height);
     if (!view.IsValid()) return;
     StrokeScale const scale = view.GetScale(mStroke->GetExtent());

@@ -80,43 +80,4 @@ JNIEXPORT jbyteArray JNICALL Java_moka_Host_decodeNatively(JNIEnv* env, jclass, 
     String const file = ToString(env, path);
     return ToArray(env, std::unique_ptr<Bitmap>(BitmapFactory::CreateBitmapForGraphics(&file)));
 }
-
-JNIEXPORT jboolean JNICALL Java_moka_Host_save(JNIEnv* env, jclass, jstring path, jint width, jint height,
-                                               jbyteArray pixels) {
-    String const file = ToString(env, path);
-    std::vector<unsigned char> copy(static_cast<std::size_t>(env->GetArrayLength(pixels)));
-    env->GetByteArrayRegion(pixels, 0, static_cast<jsize>(copy.size()),
-                            reinterpret_cast<jbyte*>(copy.data()));
-    Bitmap bitmap;
-    return bitmap.Construct(copy.data(), width, height, width * 4, Bitmap::kFormatRgba8888, false, false) &&
-           BitmapFactory::SaveBitmap(&bitmap, &file, 100);
-}
-
-JNIEXPORT jdoubleArray JNICALL Java_moka_Host_readDisplay(JNIEnv* env, jclass, jlong handle) {
-    IDisplay const& display = *reinterpret_cast<Display const*>(static_cast<std::intptr_t>(handle));
-    jdouble const values[] = {
-        jdouble(display.GetWidthPixels()),
-        jdouble(display.GetHeightPixels()),
-        jdouble(display.GetSystemDensity()),
-        jdouble(display.GetLocalWidthPixels()),
-        jdouble(display.GetLocalHeightPixels()),
-        jdouble(display.GetDensity()),
-        jdouble(display.GetScaledDensity()),
-        jdouble(display.GetDensityDpi()),
-        jdouble(display.GetXdpi()),
-        jdouble(display.GetYdpi()),
-        jdouble(display.GetLayoutDirection()),
-        jdouble(display.GetOrientation()),
-        jdouble(display.GetScreenOrientation()),
-        jdouble(display.IsTablet()),
-        jdouble(display.IsUWP()),
-        jdouble(display.GetAppVsyncOffsetNanos()),
-        jdouble(display.IsTabletUX()),
-        jdouble(display.GetDebugLevel()),
-    };
-    jsize const count = static_cast<jsize>(std::size(values));
-    jdoubleArray const array = env->NewDoubleArray(count);
-    env->SetDoubleArrayRegion(array, 0, count, values);
-    return array;
-}
 }

@@ -1,8 +1,9 @@
 package moka;
 
 import java.util.List;
+import java.util.concurrent.Callable;
 
-/** The native side of the test programs: what an application's own library would do. */
+/** The native side of the test programs, what an application's own library would do; and what they check with. */
 final class Host {
     static {
         System.loadLibrary("moka_jvm_host");
@@ -16,18 +17,28 @@ final class Host {
     /** The same by the native codecs. */
     static native byte[] decodeNatively(String path);
 
-    static native boolean save(String path, int width, int height, byte[] pixels);
-
     /** What MKBitmapFactory_OnLoad returns. */
     static native int loadBridge();
-
-    /** Everything that native code reads of a display, in the order of its constructor, then the rest. */
-    static native double[] readDisplay(long handle);
 
     private static native String[] takeLog();
 
     /** The texts that were logged since the last call. */
     static List<String> log() {
         return List.of(takeLog());
+    }
+
+    /** The first thing that does not hold ends the program. */
+    static void expect(boolean holds, String what) {
+        if (!holds) throw new AssertionError(what);
+    }
+
+    static void expectThrown(Class<? extends Throwable> type, Callable<?> body) {
+        try {
+            body.call();
+        } catch (Throwable thrown) {
+            expect(type.isInstance(thrown), "expected " + type.getName() + ", got " + thrown);
+            return;
+        }
+        throw new AssertionError(type.getName() + " was not thrown");
     }
 }

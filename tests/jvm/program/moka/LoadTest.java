@@ -1,9 +1,13 @@
 package moka;
 
+import com.velmora.android.sdk.pen.view.MokaDisplay;
 import java.util.List;
 import java.util.stream.Collectors;
 
-/** What System.loadLibrary does. The loader's thread, which waits for ever, must not keep the process. */
+/**
+ * What System.loadLibrary does, and the life of a display. The loader's thread, which waits for ever, must not keep the
+ * process.
+ */
 public final class LoadTest {
     private static final String ON_LOAD = "BitmapLoader void BitmapLoader_OnLoad(JavaVM *, JNIEnv *)";
     private static final String LOOP =
@@ -16,15 +20,27 @@ public final class LoadTest {
                 "Display JNI_OnLoad Success", ON_LOAD + " JNI_OnLoad enter!",
                 ON_LOAD + " JNI_OnLoad Success!", "Graphics JNI_OnLoad Success");
         List<String> logged = Host.log();
-        Expect.equal(expected,
-                logged.stream().filter(expected::contains).collect(Collectors.toList()), "log");
+        Host.expect(logged.stream().filter(expected::contains).collect(Collectors.toList()).equals(expected),
+                "logged " + logged);
         for (int i = 0; i < 1000 && !logged.contains(LOOP); ++i, logged = Host.log()) {
             Thread.sleep(10);
         }
-        Expect.isTrue(logged.contains(LOOP), "the loader's thread did not come");
-        long threads = Thread.getAllStackTraces().keySet().stream()
+        Host.expect(Thread.getAllStackTraces().keySet().stream()
                 .filter(thread -> thread.getName().equals("MokaBitmapLoader thread") && thread.isDaemon())
-                .count();
-        Expect.equal(1L, threads, "loader threads");
+                .count() == 1, "the loader's thread");
+
+        MokaDisplay display = new MokaDisplay(1, 2, 3, 4, 5, 6, 7, 8, 9, 10, 11, 12, 13, true, 14);
+        display.setDebugLevel(-3);
+        display.updateScreenOrientation(99);
+        try (MokaDisplay copy = new MokaDisplay(0, 0, 2, 0, 0, 0, 0, 320, 0, 0, 0, 0, 0, false, 0)) {
+            copy.copy(display);
+            Host.expectThrown(NullPointerException.class, () -> {
+                copy.copy(null);
+                return null;
+            });
+        }
+        display.close();
+        display.close();
+        Host.expectThrown(IllegalStateException.class, display::getHandle);
     }
 }
