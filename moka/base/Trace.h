@@ -58,12 +58,10 @@ public:
     static void NameTask(char const* name) noexcept {
         if (IsOn()) SetTaskName(name);
     }
-    /// The name of a task.
-    /// name: the name that was set since the last call, or null.
-    /// changed: the time at which it was set, if it differs from the name before.
+    /// A task's name and the time at which it became the name.
     struct TaskName {
-        char const* name;
-        std::int64_t changed;
+        char const* name;     ///< the name that was set since the last call, or null
+        std::int64_t changed; ///< the time at which it was set, if it differs from the previous name
     };
     /// Returns the name that was set since the last call. A queue calls it after each task.
     static TaskName TakeTaskName() noexcept;

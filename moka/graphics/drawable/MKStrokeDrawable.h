@@ -49,7 +49,7 @@ public:
 
     /// Appends copies of the points. Null or a count below 1 does nothing.
     void Append(MKStrokePoint const* points, int count);
-    /// Removes all points. Draws posted before still draw the old points.
+    /// Removes all points and keeps their memory. Draws posted before still draw the old points.
     void Clear();
 
     /// The rectangle that encloses all valid points with their widths; empty without points. Soft edges

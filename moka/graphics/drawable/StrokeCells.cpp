@@ -1,6 +1,7 @@
 #include "moka/graphics/drawable/StrokeCells.h"
 
 #include <algorithm>
+#include <array>
 #include <limits>
 
 namespace Moka::detail {
@@ -15,7 +16,7 @@ constexpr double kLeafOfLength = 1.0 / 64;
 // kMostEntries are kept.
 constexpr int kManyEntries = 24;
 constexpr double kLeastLeafPixels = 0.25;
-constexpr int kMostEntries = 64;
+constexpr std::size_t kMostEntries = 64; // a leaf that may be split has fewer
 constexpr std::size_t kKeptEntries = 32;
 // The smallest side of a cell, in device pixels.
 constexpr double kLeastCellPixels = 0.25;
@@ -49,6 +50,16 @@ void StrokeCells::Add(StrokeSegment const& segment, bool mayBeTakenBack) {
 void StrokeCells::TakeBackLast() {
     Remove(0, mRoot, static_cast<int>(mSegments.size()) - 1);
     mSegments.pop_back();
+    mMayTakeBack = false;
+}
+
+void StrokeCells::Clear() {
+    mSegments.clear();
+    mNodes.clear();
+    mEntries.clear();
+    mCells.clear();
+    mNextCell.clear();
+    mFreeCell = kNone;
     mMayTakeBack = false;
 }
 
@@ -158,9 +169,10 @@ void StrokeCells::AddEntry(int node, int segment) {
 
 void StrokeCells::Split(int node, Square const& square, double target) {
     FreeCells(node);
-    std::vector<int> segments;
-    for (int i = mNodes[At(node)].entries; i != kNone; i = mEntries[At(i)].next) {
-        segments.push_back(mEntries[At(i)].segment);
+    std::array<int, kMostEntries> segments; // the latest first
+    auto end = segments.begin();
+    for (int i = mNodes[At(node)].entries; i != kNone && end != segments.end(); i = mEntries[At(i)].next) {
+        *end++ = mEntries[At(i)].segment;
     }
     int const children = static_cast<int>(mNodes.size());
     mNodes.resize(mNodes.size() + 4);
@@ -168,8 +180,9 @@ void StrokeCells::Split(int node, Square const& square, double target) {
     mNodes[At(node)].entries = kNone;
     mNodes[At(node)].entryCount = 0;
     // Keeps the order in which the segments were added.
-    for (auto segment = segments.rbegin(); segment != segments.rend(); ++segment) {
-        for (int i = 0; i < 4; ++i) Insert(children + i, square.GetQuarter(i), *segment, target);
+    while (end != segments.begin()) {
+        --end;
+        for (int i = 0; i < 4; ++i) Insert(children + i, square.GetQuarter(i), *end, target);
     }
 }
 
@@ -215,8 +228,9 @@ void StrokeCells::FreeCellsBelow(int node) {
 }
 
 void StrokeCells::LimitEntries(int node, Square const& square) {
-    if (mNodes[At(node)].entryCount < kMostEntries) return;
-    std::vector<Candidate> candidates;
+    if (At(mNodes[At(node)].entryCount) < kMostEntries) return;
+    std::vector<Candidate>& candidates = mCandidates;
+    candidates.clear();
     for (int i = mNodes[At(node)].entries; i != kNone; i = mEntries[At(i)].next) {
         candidates.push_back(Judge(mEntries[At(i)].segment, square));
     }

@@ -36,6 +36,8 @@ public:
     // true.
     void Add(StrokeSegment const& segment, bool mayBeTakenBack);
     void TakeBackLast();
+    // Removes all segments and keeps their memory.
+    void Clear();
 
     // Updates and returns the cells.
     std::vector<StrokeCell> const& Make();
@@ -112,7 +114,7 @@ private:
     std::vector<StrokeCell> mCells;
     std::vector<int> mNextCell; // the next cell of the same node, or the next free one
     int mFreeCell = kNone;
-    std::vector<Candidate> mCandidates; // used while cells are created
+    std::vector<Candidate> mCandidates; // used while cells are created or entries are limited
     std::vector<Point> mPoints;         // of the cell that is being created
 };
 

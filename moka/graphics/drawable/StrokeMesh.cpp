@@ -26,6 +26,12 @@ std::vector<StrokeCell> const& StrokeMesh::Update(std::vector<MKStrokePoint> con
     return mCells.Make();
 }
 
+void StrokeMesh::Clear() {
+    mCells.Clear();
+    mTaken = 0;
+    mOpenCount = 0;
+}
+
 void StrokeMesh::Take(StrokeNode const& point) {
     if (mTaken == 0) {
         mKept = point;

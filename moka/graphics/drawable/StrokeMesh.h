@@ -27,6 +27,9 @@ public:
     // one point.
     std::vector<StrokeCell> const& Update(std::vector<MKStrokePoint> const& points);
 
+    // As at the start; keeps the memory.
+    void Clear();
+
 private:
     // The most consecutive points that are dropped.
     static constexpr std::size_t kMostSkipped = 32;

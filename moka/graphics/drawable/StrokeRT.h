@@ -20,7 +20,7 @@ class StrokeRT {
 public:
     // Throws bad_alloc; the stroke is then unchanged.
     void Append(std::vector<MKStrokePoint> const& points);
-    void Clear();
+    void Clear(); // keeps the memory, so that ink drawn anew in each frame allocates nothing
     std::vector<MKStrokePoint> const& GetPoints() const { return mPoints; }
 
     bool IsEmpty() const { return mPoints.empty(); }
