@@ -1,4 +1,4 @@
-// What a person does in the window.
+// The commands of keys, buttons and dropped files.
 #include "apps/notebook/Notebook.h"
 #include "apps/notebook/PageFile.h"
 #include "moka/graphics/factory/BitmapsAndCanvases.h"
@@ -12,14 +12,14 @@ namespace {
 
 namespace fs = std::filesystem;
 
-constexpr int kEnd = 8 * Page::kMaxHeight; // farther than any page reaches at any zoom
-constexpr float kDropSide = 480;           // the longer side of an image that is put on the page
+constexpr int kEnd = 8 * Page::kMaxHeight; // scrolls to the end of any page at any zoom
+constexpr float kDropSide = 480;           // the longest side of a new image, in page pixels
 
 struct Shortcut {
     SDL_Keycode key;
     bool isControl;
     Action action;
-    Action shifted; // if it is another one
+    Action shifted; // the action with Shift, if it differs
 };
 
 constexpr Action ChooseTool(Tool tool) { return {Command::Choose, static_cast<int>(tool)}; }
@@ -154,7 +154,7 @@ void Notebook::DoWithFiles(Command command) {
     case Command::Open:
         return Ask(command, "open", path.parent_path() / "");
     case Command::ExportView:
-        return Ask(command, "export what is seen to", picture);
+        return Ask(command, "export the view to", picture);
     case Command::ExportPage:
         return Ask(command, "export the page to", picture);
     case Command::Paste:
@@ -189,12 +189,11 @@ void Notebook::Export(bool isPage, std::string const& path) {
     int const height = isPage ? mDocument.GetPage().GetHeight() : mView.height;
     if (height > BitmapFactory::kMaxSide)
         return Tell("the page has " + std::to_string(height) + " rows and an image at most " +
-                        std::to_string(BitmapFactory::kMaxSide) + "; export what is seen instead",
+                        std::to_string(BitmapFactory::kMaxSide) + "; export the view instead",
                     true);
     auto const bitmap = NewBitmap(mQueue, width, height);
     auto const canvas = NewCanvas(mQueue, bitmap);
-    if (!canvas)
-        return Tell("there is no memory for an image of the page; export what is seen instead", true);
+    if (!canvas) return Tell("there is no memory for an image of the page; export the view instead", true);
     Viewport view = mView;
     view.top = 0;
     if (isPage) view = Viewport{1, 0, 0, width, height, 0};
@@ -227,7 +226,8 @@ void Notebook::Drop(std::string const& file, PointF const& at) {
     Insert(path.string(), mView.ToPage({at.x, std::max(at.y, static_cast<float>(mView.top))}));
 }
 
-// Its corner at the pointer; whole on the page, and selected, so that it can be moved and scaled at once.
+// Puts the image with its corner at the pointer, and completely on the page. Selects it, so that the user can move and
+// scale it at once.
 void Notebook::Insert(std::string file, PointF at) {
     int width = 0;
     int height = 0;
@@ -253,7 +253,7 @@ void Notebook::Quit() {
     mStatus = isKept ? 0 : 1;
     mIsRunning = !isKept && !mHasQuitFailed;
     mHasQuitFailed = true;
-    if (mIsRunning) Tell(mMessage + ". Close the window again to leave all the same", true);
+    if (mIsRunning) Tell(mMessage + ". Close the window again to quit without saving", true);
 }
 
 } // namespace Moka::Notebook

@@ -13,7 +13,7 @@ namespace {
 
 namespace fs = std::filesystem;
 
-// As the XDG base directories have it.
+// Returns a folder of the XDG base directories.
 fs::path GetUserFolder(char const* variable, char const* inHome) {
     char const* const chosen = std::getenv(variable);
     char const* const home = std::getenv("HOME");
@@ -30,7 +30,7 @@ std::string Document::GetLastPath() {
     std::string reason;
     if (ReadFile(GetNote().string(), path, reason) && !path.empty()) return path;
     fs::path const folder = GetUserFolder("XDG_DATA_HOME", ".local/share");
-    std::error_code ignored; // saving will tell
+    std::error_code ignored; // a save reports the error
     fs::create_directories(folder, ignored);
     return (folder / "page.json").string();
 }
@@ -68,7 +68,7 @@ bool Document::Open(std::string const& path) {
     if (mMustRename) {
         std::size_t const more = opened.problems.size() - 1;
         mCallbacks.tell(opened.problems.front() + (more ? " (and " + std::to_string(more) + " more)" : "") +
-                            "; what could be read is shown, and can be saved under another name",
+                            "; the rest is shown, and can be saved under another name",
                         true);
     }
     fs::path const note = GetNote();
@@ -94,12 +94,12 @@ void Document::DropOtherLocks() {
 bool Document::Save(std::string const* path) {
     std::string const to = path ? fs::absolute(*path).lexically_normal().string() : GetPath();
     if (mMustRename && to == GetPath()) {
-        mCallbacks.tell(to + " was not read whole and is not replaced; save under another name", true);
+        mCallbacks.tell(to + " was not read completely and is not replaced; save under another name", true);
         return false;
     }
     if (!Lock(to)) return false;
     Autosave();
-    mHasUnsaved = false; // until the report says otherwise
+    mHasUnsaved = false; // a failed save sets it again
     Run([this, objects = mPage.GetObjects(), height = mPage.GetHeight(), to] {
         return mStore.Save(objects, height, to);
     });

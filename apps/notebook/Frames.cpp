@@ -9,7 +9,7 @@
 
 static thread_local std::uint64_t tAllocations = 0;
 
-// All C++ code of the process comes here: the library, the application, and what a driver has of it.
+// Replaces operator new for all C++ code of the process: the library, the application and the driver.
 MOKA_API void* operator new(std::size_t size) {
     ++tAllocations;
     if (void* const memory = std::malloc(size > 0 ? size : 1)) return memory;
@@ -50,7 +50,7 @@ void Frames::End() {
     mInput = 0;
 }
 
-// The render thread comes here when the swap before has returned.
+// The render thread runs this when the previous swap has returned.
 void Frames::Finish(std::int64_t begin, std::int64_t input) {
     std::int64_t const now = Trace::GetTime();
     Trace::NameTask("frame shown");

@@ -1,6 +1,6 @@
-// Frames: when frames began, when they were shown, which input they show, and what the render thread allocated for
-// them: for the trace and --statistics.
-// Thread: the window's; the moment of showing is taken on the render thread, which allocates nothing for it.
+// Frames: records for each frame when it began, when it was shown, the age of its input, and the allocations of the
+// render thread. The trace and --statistics use the records.
+// Thread: the window's. A task on the render thread reads the time at which a frame is shown; it does not allocate.
 #pragma once
 
 #include "moka/base/Trace.h"
@@ -15,21 +15,21 @@ namespace Moka::Notebook {
 
 class Frames {
 public:
-    static constexpr std::size_t kMaxFrames = 100'000; // that are counted
+    static constexpr std::size_t kMaxFrames = 100'000; // later frames are not recorded
 
     // notify is called on the render thread when a frame has been shown.
     Frames(RenderThread& queue, bool isCounting, std::function<void()> notify);
 
-    // Input that the next frame shows; `age` in milliseconds. The oldest counts.
+    // Records input that the next frame shows, `age` milliseconds old. The oldest input counts.
     void Mark(std::uint32_t age);
     void Begin() { mBegin = Trace::GetTime(); }
-    // Right after Present.
+    // Call this directly after Present.
     void End();
-    // While it is, input is collected for the next frame: what is requested now would only wait.
+    // While a frame is in flight, the window collects input for the next one: a frame requested now would wait.
     bool IsInFlight() const { return mIsInFlight; }
-    // The milliseconds from Begin to the end of the swap. No frame is in flight.
+    // The milliseconds from Begin to the end of the swap. Call this only while no frame is in flight.
     double GetLast() const { return mLast; }
-    // Once the render thread has nothing more to do.
+    // Call this when the render thread has no more tasks.
     void Print() const;
 
 private:
@@ -37,7 +37,7 @@ private:
         std::int64_t begin; // all in nanoseconds; input is 0 for none
         std::int64_t input;
         std::int64_t end;
-        std::uint64_t allocations; // of the render thread, from its start on
+        std::uint64_t allocations; // of the render thread since its start
     };
     void Finish(std::int64_t begin, std::int64_t input);
 
@@ -48,7 +48,7 @@ private:
     std::int64_t mBegin = 0;
     std::int64_t mInput = 0;
     double mLast = 0;
-    std::vector<Shown> mShown; // the render thread's while it runs
+    std::vector<Shown> mShown; // only the render thread uses it while that runs
 };
 
 } // namespace Moka::Notebook

@@ -62,7 +62,7 @@ bool Images::HasFailed(std::string const& file) const {
 }
 
 void Images::Receive(int request, IMKBitmap* bitmap) {
-    // As the page's file says it: an image is often drawn much smaller than it is.
+    // The same filter as in the page's file: images are often minified.
     if (bitmap) bitmap->GetBitmapReadable()->SetTextureFilter(TextureFilterMipmapped);
     {
         std::lock_guard<std::mutex> const lock(mMutex);
@@ -81,7 +81,7 @@ std::vector<std::string> Images::Poll() {
     for (Result& result : results) {
         --mPending;
         for (auto& [file, entry] : mEntries) {
-            if (entry.request != result.request) continue; // of a page that was left
+            if (entry.request != result.request) continue; // a request of an earlier page
             entry.hasFailed = !result.bitmap;
             entry.bitmap = std::move(result.bitmap);
             files.push_back(file);

@@ -1,7 +1,7 @@
 // Images: the bitmaps of the page's images, loaded in the background.
-// Owner:   the application; destroyed before its queue.
-// Thread:  the window's; wake is called on the loader's thread when Poll has something new.
-// Limits:  as many files, and pixels together, as a scene may have.
+// Owner:   the application, which destroys it before its queue.
+// Thread:  the window's. The loader's thread calls wake when Poll has a new result.
+// Limits:  the number of files and the sum of their pixels are those of a scene.
 #pragma once
 
 #include "moka/base/RefPtr.h"
@@ -23,23 +23,24 @@ public:
     Images(IGLMsgQueue& queue, std::function<void()> wake);
     ~Images();
 
-    // The size of the file's image, read from its header, once it may be put on the page. A reason otherwise.
+    // Reads the size of the image from the file's header. If the image cannot be put on the page, sets reason and
+    // returns false.
     bool Measure(std::string const& file, int& width, int& height, std::string& reason);
 
-    // Asks for it when it is asked for the first time. Null while it is loaded, and when it cannot be.
+    // The first call for a file requests its load. Returns null while it is loading, and if it could not be loaded.
     IMKBitmap* Get(std::string const& file);
     bool HasFailed(std::string const& file) const;
 
-    // For another page: everything is loaded anew when it is asked for.
+    // Drops all bitmaps, for another page. Get loads them again.
     void Forget() { mEntries.clear(); }
 
-    // Files that were loaded, or could not be, since the last call.
+    // Returns the files whose load has ended or failed since the last call.
     std::vector<std::string> Poll();
     bool IsBusy() const { return mPending > 0; }
 
 private:
     struct Entry {
-        RefPtr<IMKBitmap> bitmap; // null while it is loaded
+        RefPtr<IMKBitmap> bitmap; // null while it is loading
         bool hasFailed = false;
         int request = 0;
         std::int64_t pixels = 0;
@@ -54,12 +55,12 @@ private:
 
     IGLMsgQueue& mQueue;
     std::function<void()> const mWake;
-    std::map<std::string, Entry> mEntries; // by their files
+    std::map<std::string, Entry> mEntries; // by file
     int mRequests = 0;
     int mPending = 0;
     std::mutex mMutex;
     std::vector<Result> mResults;
-    std::unique_ptr<MKBitmapLoader> mLoader; // goes first: it calls back
+    std::unique_ptr<MKBitmapLoader> mLoader; // destroyed first, because its callbacks use the other members
 };
 
 } // namespace Moka::Notebook

@@ -6,7 +6,7 @@
 namespace Moka::Notebook {
 namespace {
 
-constexpr int kHalvings = 24; // of a segment: 1/16,000,000 of its length
+constexpr int kHalvings = 24; // bisections of a segment, down to 1/16,000,000 of its length
 
 float GetDistance(PointF const& a, PointF const& b, float x, float y) {
     float const dx = b.x - a.x;
@@ -20,7 +20,8 @@ InkPoint Mix(InkPoint const& a, InkPoint const& b, float t) {
     return {a.x + (b.x - a.x) * t, a.y + (b.y - a.y) * t, a.width + (b.width - a.width) * t};
 }
 
-// Where on the segment the distance is least. It is convex along the segment, so halving finds it.
+// Returns the parameter of the segment's point with the least distance. The distance is convex along the segment, so a
+// ternary search finds it.
 float FindNearest(Swipe const& swipe, InkPoint const& a, InkPoint const& b) {
     auto const distance = [&](float t) {
         InkPoint const p = Mix(a, b, t);
@@ -38,7 +39,7 @@ float FindNearest(Swipe const& swipe, InkPoint const& a, InkPoint const& b) {
     return (low + high) / 2;
 }
 
-// The end of the erased part between `inside` and `outside`, both parameters of the segment.
+// Returns the end of the erased part between `inside` and `outside`, which are parameters of the segment.
 float FindEdge(Swipe const& swipe, InkPoint const& a, InkPoint const& b, float inside, float outside) {
     for (int i = 0; i < kHalvings; ++i) {
         float const middle = (inside + outside) / 2;
@@ -58,7 +59,7 @@ RectF GetBounds(InkPoints const& points) {
     if (points.empty()) return {};
     RectF bounds(points[0].x, points[0].y, points[0].x, points[0].y);
     for (InkPoint const& p : points) {
-        float const r = p.width / 2 + 1; // and the soft edge
+        float const r = p.width / 2 + 1; // 1 for the soft edge
         bounds.MakeRect(p.x - r, p.y - r);
         bounds.MakeRect(p.x + r, p.y + r);
     }

@@ -20,15 +20,16 @@ struct InkPoint {
 };
 using InkPoints = std::vector<InkPoint>;
 
-// A hundredth of a pixel, which is what a page's file holds: a saved stroke is read back bit by bit.
+// Rounds to 0.01 pixel, the precision of a page's file. So a stroke that is read back equals the saved one.
 float RoundForFile(float value);
 
-// Empty for no points.
+// Returns an empty rectangle if there are no points.
 RectF GetBounds(InkPoints const& points);
-RectF Unite(RectF const& a, RectF const& b); // of which either may be empty
+// Either rectangle may be empty.
+RectF Unite(RectF const& a, RectF const& b);
 bool Overlaps(RectF const& a, RectF const& b);
 
-// The path of an eraser: a disc that moved from one point to another.
+// The area of an eraser: a disc that moves from one point to another.
 struct Swipe {
     PointF from;
     PointF to;
@@ -36,11 +37,12 @@ struct Swipe {
 
     RectF GetBounds() const;
     bool Touches(InkPoints const& points) const;
-    // The pieces of the stroke that lie outside, in order; the stroke itself if the swipe misses its middle line.
+    // Returns the pieces of the stroke outside the swipe, in order. If the swipe misses the centre line, the only piece
+    // is the stroke itself.
     std::vector<InkPoints> Cut(InkPoints const& points) const;
 };
 
-// Even-odd, closed from the last point to the first.
+// Tests a point against a closed polygon by the even-odd rule.
 bool IsInside(std::vector<PointF> const& polygon, float x, float y);
 // True if at least half of the points are inside.
 bool IsMostlyInside(std::vector<PointF> const& polygon, InkPoints const& points);

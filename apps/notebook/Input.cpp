@@ -1,4 +1,4 @@
-// What SDL's events mean.
+// Handles SDL's events.
 #include "apps/notebook/Notebook.h"
 
 #include <algorithm>
@@ -83,7 +83,7 @@ void Notebook::HandleFinger(SDL_TouchFingerEvent const& finger) {
     PointF const at(finger.x * static_cast<float>(mView.width),
                     finger.y * static_cast<float>(mView.height + mView.top));
     mIsDirty = true;
-    // Devices without a sensor say 1 always.
+    // Devices without a sensor always report 1.
     float const pressure = finger.pressure > 0 && finger.pressure < 1 ? finger.pressure : -1;
     if (finger.type == SDL_FINGERUP) {
         if (mFingers.erase(finger.fingerId) > 0 && !mIsPinching) PenUp(true);
@@ -105,7 +105,8 @@ void Notebook::HandleFinger(SDL_TouchFingerEvent const& finger) {
     }
 }
 
-// The other finger rests: half of the way moves the page, and the distance between them scales it.
+// One finger has moved. The page moves by half of the distance, as their centre does, and scales with the distance of
+// the two fingers.
 void Notebook::MoveFingers(PointF const& before, PointF const& after, SDL_FingerID moved) {
     bool const isFirst = mFingers.begin()->first == moved;
     PointF const other = isFirst ? mFingers.rbegin()->second : mFingers.begin()->second;

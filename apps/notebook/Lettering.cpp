@@ -10,8 +10,8 @@ namespace {
 constexpr float kAdvance = 6;
 constexpr float kThickness = 0.8f;
 
-// From ' ' to '~', then the icons. Two digits are a point, column and row of a grid of 5 by 9, of 10 by 10 for icons;
-// '|' begins another line, a space another glyph. Capitals stand on row 6.
+// The glyphs from ' ' to '~', then the icons. Two digits are a point: column and row of a grid of 5 by 9, or of 10 by
+// 10 for icons. '|' begins another line, a space another glyph. The baseline is row 6.
 constexpr char kGlyphs[] =
     " 2024|2526 1012|3032 1016|3036|0242|0444 413010010213334445361605|2026 4006|0010110100|3545463635 "
     "4612112031320405162644 2022 30212536 10212516 2125|1234|3214 2125|0343 2517 1333 2526 4006 "

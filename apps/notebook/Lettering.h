@@ -1,5 +1,5 @@
-// Lettering: text made of lines, for labels and messages, and icons, which are letters too. ASCII; any other character
-// is drawn as '?'.
+// Lettering: draws text as lines, for labels, messages and icons. Icons are characters of this font as well. The font
+// has ASCII only; any other character is drawn as '?'.
 #pragma once
 
 #include "moka/graphics/canvas/IMKCanvas.h"
@@ -8,14 +8,14 @@
 
 namespace Moka::Notebook {
 
-constexpr float kLetterHeight = 8; // grid units from the top of a capital to the lowest tail
+constexpr float kLetterHeight = 8; // grid cells from the top of a capital to the lowest descender
 constexpr float kIconSide = 9;
-// Of a tool: the letter at its number.
+// The icons of the tools, by the number of the tool.
 constexpr char const* kToolIcons[] = {"\1", "\2", "\3", "\4", "\5"};
 constexpr char kUndoIcon[] = "\6";
 constexpr char kRedoIcon[] = "\7";
 
-// unit is the side of the grid's cells in canvas pixels. (x, y) is the top left corner.
+// unit is the side of a grid cell in canvas pixels. (x, y) is the top left corner of the text.
 void DrawLetters(IMKCanvas& canvas, std::string_view text, float x, float y, float unit, unsigned argb);
 float MeasureLetters(std::string_view text, float unit);
 

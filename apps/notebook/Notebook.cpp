@@ -11,8 +11,8 @@ namespace Moka::Notebook {
 namespace {
 
 constexpr unsigned kDesk = 0xFFDDE2E8;
-constexpr float kAhead = 16;                 // milliseconds that the pen is predicted
-constexpr std::uint32_t kZoomRest = 120;     // milliseconds after which a zoom is over
+constexpr float kAhead = 16;                 // milliseconds of prediction
+constexpr std::uint32_t kZoomRest = 120;     // milliseconds without an event that end a zoom
 constexpr std::uint32_t kMessageTime = 4000; // milliseconds; errors stay until a key or a click
 constexpr float kLetter = 1.8f;
 constexpr float kLine = 34;
@@ -45,10 +45,10 @@ Notebook::Notebook(Options const& options, SDL_Window* window, RenderThread& que
     FitWindow();
 }
 
-// Frames and images may still be on their way to members.
+// Tasks may still use members.
 Notebook::~Notebook() { mQueue.WaitForTasks(); }
 
-// Any thread.
+// May run on any thread.
 void Notebook::Wake() const {
     SDL_Event event{};
     event.type = mWakeEvent;
@@ -66,7 +66,7 @@ int Notebook::Run() {
         bool const isDue = mIsDirty && !mFrames.IsInFlight();
         TakeInput(isDue ? 0 : wait);
         if (!mIsRunning || !mIsDirty || mFrames.IsInFlight()) continue;
-        // What came while the last frame was on its way, to the last moment, belongs to this one.
+        // This frame shows all input that arrived while the last frame was in flight.
         if (mReplay.IsActive()) mReplay.Pump(false);
         TakeInput(0);
         if (mIsRunning) DrawFrame();
@@ -98,7 +98,7 @@ void Notebook::TakeImages() {
     }
 }
 
-// Does what is due. Returns the milliseconds until more is, or -1.
+// Does all work that is due. Returns the milliseconds until more is due, or -1.
 int Notebook::Work() {
     std::uint32_t const now = SDL_GetTicks();
     TakeImages();
@@ -119,7 +119,7 @@ int Notebook::Work() {
     return wait;
 }
 
-// Waits so long for the first event; forever if it is negative.
+// Waits up to this time for the first event; without a limit if it is negative.
 void Notebook::TakeInput(int milliseconds) {
     SDL_Event event;
     bool const wasZooming = IsZooming();
@@ -130,7 +130,7 @@ void Notebook::TakeInput(int milliseconds) {
         if (isInput) mFrames.Mark(SDL_GetTicks() - std::min(SDL_GetTicks(), event.common.timestamp));
         Handle(event);
     }
-    if (wasZooming && !IsZooming()) mIsDirty = true; // now sharp
+    if (wasZooming && !IsZooming()) mIsDirty = true; // redraw the tiles at the new zoom
 }
 
 bool Notebook::IsZooming() const { return mZoomedAt != 0 && SDL_GetTicks() - mZoomedAt < kZoomRest; }
@@ -146,7 +146,7 @@ void Notebook::PageHasChanged(Splice const& splice) {
     MoveView();
 }
 
-// The window has another size, or has to be drawn again.
+// The window has another size or must be redrawn.
 void Notebook::FitWindow() {
     int width = 1;
     int height = 1;
@@ -157,7 +157,7 @@ void Notebook::FitWindow() {
     mScreen = NewCanvas(mQueue, NewScreenBitmap(mQueue, width, height));
 }
 
-// At once, not with the next frame: the pen may come before it.
+// Takes effect at once, because input may arrive before the next frame.
 void Notebook::MoveView() {
     mView.Clamp(mDocument.GetPage().GetHeight());
     mIsDirty = true;
@@ -199,7 +199,7 @@ void Notebook::DrawMessage(IMKCanvas& canvas) const {
     if (text.empty()) return;
     auto const width = static_cast<float>(mView.width);
     auto const bottom = static_cast<float>(mView.top + mView.height);
-    // Long ones take several lines.
+    // Long texts take several lines.
     auto const perLine =
         static_cast<std::size_t>(std::max(20.0f, (width - 24) / MeasureLetters("m", kLetter)));
     std::size_t const count = (text.size() + perLine - 1) / perLine;
@@ -215,7 +215,7 @@ void Notebook::DrawMessage(IMKCanvas& canvas) const {
 }
 
 void Notebook::Tell(std::string const& message, bool isError) {
-    if (mIsError && !mMessage.empty() && !isError) return; // which nobody has read yet
+    if (mIsError && !mMessage.empty() && !isError) return; // the error has not been read yet
     mMessage = message;
     mIsError = isError;
     mToldAt = SDL_GetTicks();

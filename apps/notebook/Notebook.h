@@ -1,7 +1,7 @@
-// Notebook: the window: what comes in goes to the tools and the document, and what they say is drawn.
-// Owner:   main; the SDL window outlives it.
-// Thread:  the one that made the window.
-// Units:   the window's pixels; milliseconds as SDL's events have them. Pressure is 0 ... 1, -1 where it is unknown.
+// Notebook: the window. It passes input to the tools and the document, and draws the page and their messages.
+// Owner:   main. The SDL window must outlive it.
+// Thread:  the one that created the window.
+// Units:   the window's pixels; milliseconds of SDL's events. Pressure is 0 to 1, or -1 if it is unknown.
 #pragma once
 
 #include "apps/notebook/Document.h"
@@ -17,7 +17,7 @@
 namespace Moka::Notebook {
 
 struct Options {
-    std::string page; // empty: the one that was open last
+    std::string page; // empty for the last page
     std::string replay;
     std::string record;
     std::string trace;
@@ -33,12 +33,12 @@ public:
     Notebook(Options const& options, SDL_Window* window, RenderThread& queue);
     ~Notebook();
 
-    // Until the window is closed. The exit status.
+    // Runs until the window is closed. Returns the exit status.
     int Run();
 
 private:
-    // What SDL's events mean: a pen (mouse or one finger), two fingers that pan and zoom, a wheel, keys, dropped
-    // files. The second finger takes back what the first one has begun.
+    // Handles SDL's events: a pen (the mouse or one finger), two fingers that pan and zoom, the wheel, keys, dropped
+    // files. The second finger cancels what the first one has begun.
     void Handle(SDL_Event const& event);
     void HandleButton(SDL_MouseButtonEvent const& button);
     void HandleMotion(SDL_MouseMotionEvent const& motion);
@@ -95,12 +95,12 @@ private:
     PointF mMouse;
     bool mIsPinching = false; // until the last finger is up
     bool mIsPanning = false;  // with the middle button
-    bool mIsControl = false;  // the key is down
+    bool mIsControl = false;  // the Control key is down
 
     std::string mMessage;
     bool mIsError = false;
     std::uint32_t mToldAt = 0;
-    Command mAsking = Command::None; // what the prompt is for
+    Command mAsking = Command::None; // the command whose prompt is shown
     std::string mQuestion;
     std::string mAnswer;
 

@@ -1,9 +1,9 @@
-// Page: the document: a list of objects, the lowest first, and how it has changed. Pixels are made from it.
-// Owner:   objects are shared and never change; an edit puts others in their place.
-// Thread:  one, like any value. A copy of the objects may go to another thread.
+// Page: the model: a list of objects, the lowest first, and its history of edits.
+// Owner:   objects are shared and immutable; an edit replaces them.
+// Thread:  one at a time. Another thread may use a copy of the objects.
 // Units:   pixels of the page, 1200 wide, origin top left, y down.
-// Undo:    each edit is kept, without a limit of their number, until the objects that the edits name are larger
-//          than kHistoryBytes; then the oldest edits go.
+// Undo:    the number of edits is not limited. If the objects of all edits are larger than kHistoryBytes, the oldest
+//          edits are dropped.
 #pragma once
 
 #include "apps/notebook/Ink.h"
@@ -41,7 +41,7 @@ struct Object {
 using ObjectPtr = std::shared_ptr<Object const>;
 using Objects = std::vector<ObjectPtr>;
 
-// Objects from `at` on are taken out, and others put there.
+// Replaces `removed`, which begin at index `at`, by `inserted`.
 struct Splice {
     std::size_t at = 0;
     Objects removed;
@@ -57,21 +57,21 @@ public:
     static constexpr int kMaxHeight = 1'000'000;
     static constexpr std::size_t kHistoryBytes = std::size_t{64} << 20;
 
-    // Called after each splice, those of undo and redo among them.
+    // Called after each splice, including those of undo and redo.
     using Listener = std::function<void(Splice const&)>;
     explicit Page(Listener listener = {}) : mListener(std::move(listener)) {}
 
-    // In the place of everything, without a way back and without a call.
+    // Replaces all objects and clears the history. Does not call the listener.
     void Reset(Objects objects);
 
     Objects const& GetObjects() const { return mObjects; }
-    // Positions of those whose bounds overlap the area, the lowest first.
+    // Returns the indices of the objects whose bounds overlap the area, the lowest first.
     std::vector<std::size_t> Find(RectF const& area) const;
-    // As long as what is on it, a margin below, and at least kMinHeight.
+    // The height of the content and a margin below, at least kMinHeight.
     int GetHeight() const { return mHeight; }
 
-    // Applies a splice whose `removed` are there; what is false is refused. Between Begin and End all of them are
-    // one edit.
+    // Applies a splice. Returns false and changes nothing if `removed` are not the objects at `at`. All splices between
+    // Begin and End form one edit.
     bool Apply(Splice splice);
     void Begin();
     void End();
@@ -96,10 +96,10 @@ private:
 
     Listener mListener;
     Objects mObjects;
-    std::vector<RectF> mBounds; // of mObjects, together in memory: Find looks at all of them
+    std::vector<RectF> mBounds; // of mObjects, contiguous in memory because Find reads all of them
     int mHeight = kMinHeight;
-    int mDepth = 0; // of Begin
-    Edit mEdit;     // since Begin
+    int mDepth = 0; // calls of Begin without End
+    Edit mEdit;     // the splices since Begin
     std::deque<Edit> mUndo;
     std::vector<Edit> mRedo;
     std::size_t mHistoryBytes = 0;

@@ -29,7 +29,7 @@ std::string NameFile(std::string const& file, std::string const& folder) {
     return isInside ? relative.string() : file;
 }
 
-// As few digits as tell hundredths apart.
+// The fewest digits that distinguish hundredths.
 double ToHundredths(float value) { return std::round(static_cast<double>(value) * 100) / 100; }
 
 json WriteStroke(Stroke const& stroke) {
@@ -92,7 +92,8 @@ public:
 
     PageText Take() { return std::move(mResult); }
 
-    // As WritePage wrote it, so that no tree of a large page is made. False, with nothing read, if it is not.
+    // Reads the layout of WritePage line by line, which needs no tree of the whole page. Returns false and reads nothing
+    // if the text has another layout.
     bool ReadLines(std::string_view text) {
         std::size_t const start = text.find(kStart);
         if (start == std::string_view::npos) return false;
@@ -137,10 +138,10 @@ private:
         fields.CheckAll();
     }
 
-    // line: where the text stands in the file; 0 for the whole file.
+    // line: the line of the text in the file, or 0 for the whole file.
     template <class Function>
     bool Parse(int line, std::string_view text, Function const& function) {
-        SceneValue root; // outlives the errors that name values of it
+        SceneValue root; // must outlive errors, which refer to its values
         return Guard(line, [&] {
             root = Scenes::ParseSceneText(text);
             function(root);

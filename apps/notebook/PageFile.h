@@ -1,8 +1,8 @@
-// PageFile: a page as the text of a scene (docs/scene-format.md), one operation a line, and back.
+// PageFile: converts a page to the text of a scene (docs/scene-format.md), one operation a line, and back.
 // Strokes are DrawStroke, images DrawBitmap; a bitmap's name is its file. Files inside the page's folder are named
 // relative to it.
 // Thread: any.
-// Fails:  reading never throws. What cannot be read is left out and told, with its line.
+// Fails:  ReadPage does not throw. It omits what it cannot read and reports a problem with the line.
 #pragma once
 
 #include "apps/notebook/Page.h"
@@ -13,7 +13,7 @@
 
 namespace Moka::Notebook {
 
-// One object as an operation, and back: throws Scenes::SceneError.
+// Converts one object to an operation, and back. ReadOperation throws Scenes::SceneError.
 std::string WriteOperation(Object const& object, std::string const& folder);
 ObjectPtr ReadOperation(std::string_view text, std::string const& folder);
 
@@ -21,12 +21,12 @@ std::string WritePage(Objects const& objects, int height, std::string const& fol
 
 struct PageText {
     Objects objects;
-    std::vector<std::string> problems; // if any, not everything was read
+    std::vector<std::string> problems; // not empty if something was omitted
 };
-// name stands for the file in messages.
+// Messages use name as the file's name.
 PageText ReadPage(std::string_view text, std::string const& name, std::string const& folder);
 
-// Whether the path can stand in a file of JSON: it is UTF-8.
+// True if the path is UTF-8, so that a JSON file can contain it.
 bool IsWritablePath(std::string const& path);
 
 } // namespace Moka::Notebook

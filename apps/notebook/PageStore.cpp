@@ -25,15 +25,15 @@ std::string GetFolder(std::string const& path) { return fs::path(path).parent_pa
 
 std::string GetJournal(std::string const& path) { return path + ".journal"; }
 
-// "continues" opens a journal and names the content that its splices begin with; "saved" says which content they
-// have become.
+// A journal begins with "continues" and the fingerprint of the file that its splices change. A save appends "saved" and
+// the fingerprint of the new file.
 std::string MakeMark(char const* word, std::uint64_t fingerprint) {
     char line[64];
     std::snprintf(line, sizeof(line), "%s %016" PRIx64 "\n", word, fingerprint);
     return line;
 }
 
-// "splice AT REMOVED INSERTED", and a line for each object that is inserted.
+// Writes "splice AT REMOVED INSERTED", and a line for each inserted object.
 std::string WriteSplice(Splice const& splice, std::string const& folder) {
     std::string text = "splice " + std::to_string(splice.at) + ' ' + std::to_string(splice.removed.size()) +
                        ' ' + std::to_string(splice.inserted.size()) + '\n';
@@ -43,13 +43,14 @@ std::string WriteSplice(Splice const& splice, std::string const& folder) {
 
 std::string_view TakeLine(std::string_view& text) {
     std::size_t const end = text.find('\n');
-    if (end == std::string_view::npos) return text = {}; // the writer was killed in this line
+    if (end == std::string_view::npos) return text = {}; // the writer was killed while it wrote this line
     std::string_view const line = text.substr(0, end);
     text.remove_prefix(end + 1);
     return line;
 }
 
-// Takes whole splices off the text. What is left of it then was cut off by a kill, or a reason says what is wrong.
+// Applies the complete splices and removes them from the text. An incomplete last splice remains, which a kill leaves
+// behind. Returns the reason if a line is invalid.
 std::string Replay(std::string_view& whole, std::string const& folder, Objects& objects) {
     using Offset = Objects::difference_type;
     for (std::string_view text = whole; !text.empty(); whole = text) {
@@ -81,7 +82,7 @@ std::string Replay(std::string_view& whole, std::string const& folder, Objects& 
 
 } // namespace
 
-// A socket without a file: the system takes the name back when the process ends, however it ends.
+// The lock is a socket in the abstract namespace: the system frees its name when the process ends, even if it is killed.
 PageLock::PageLock(std::string const& path) : mSocket(socket(AF_UNIX, SOCK_DGRAM | SOCK_CLOEXEC, 0)) {
     std::error_code ignored;
     std::string const whole = fs::weakly_canonical(path, ignored).string();
@@ -127,7 +128,7 @@ PageStore::Opened PageStore::Open(std::string const& path) {
         reason = Replay(rest, GetFolder(path), opened.objects);
         if (!reason.empty())
             opened.problems.push_back(journal + ": " + reason);
-        else if (!rest.empty()) // or the next splice would be appended to a part of one
+        else if (!rest.empty()) // the next Append must not continue an incomplete splice
             fs::resize_file(journal, splices.size() - rest.size(), ignored);
         mJournalBytes = splices.size() - rest.size();
     } else if (splices.find(MakeMark("saved", mFingerprint)) != std::string::npos ||
@@ -152,7 +153,7 @@ PageStore::Report PageStore::Append(std::vector<Splice> const& splices) {
     if (!reason.empty()) {
         report.hasFailed = true;
         report.message = "cannot autosave to " + journal + ": " + reason +
-                         "; make room: it stays in memory and is tried again";
+                         "; free some space: the changes stay in memory, and the next autosave tries again";
         return report;
     }
     mWaiting.clear();
@@ -166,7 +167,7 @@ PageStore::Report PageStore::Shorten(Objects const& objects) {
     Splice const all{0, Objects(mPageObjects), objects};
     std::string const text = MakeMark("continues", mFingerprint) + WriteSplice(all, GetFolder(mPath));
     Report report;
-    if (!ReplaceFile(GetJournal(mPath), text).empty()) return report; // the long one is as good
+    if (!ReplaceFile(GetJournal(mPath), text).empty()) return report; // the long journal stays valid
     mWaiting.clear();
     mJournalBytes = mWholeBytes = report.bytes = text.size();
     return report;
@@ -183,7 +184,8 @@ PageStore::Report PageStore::Save(Objects const& objects, int height, std::strin
     report.hasFailed = !reason.empty();
     report.message = "saved " + to;
     if (report.hasFailed)
-        report.message = "cannot save " + to + ": " + reason + "; make room, or save under another name";
+        report.message =
+            "cannot save " + to + ": " + reason + "; free some space, or save under another name";
     if (report.hasFailed) return report;
     if (mJournalBytes > 0) unlink(GetJournal(mPath).c_str());
     mPath = to;

@@ -1,10 +1,10 @@
-// PageStore: a page on the disk. A save replaces the file at once, by a rename; between saves the splices are appended
-// to a journal beside it, NAME.journal, so that an autosave writes what has changed and no more.
+// PageStore: a page on the disk. A save replaces the file atomically, by a rename. Between saves, splices are appended
+// to a journal beside it, NAME.journal, so that an autosave writes only the changes.
 // Thread:  any, one at a time.
-// Crash:   after the process or the machine ends at any moment, Open gives what was there at the last Append or
-//          Save that had finished. A journal names the content that it continues, so one that is left behind by an
-//          interrupted save is not applied twice.
-// Fails:   a message, and nothing is lost: what could not be appended is tried again with the next Append, a page
+// Crash:   if the process or the machine stops at any moment, Open returns the state after the last completed Append
+//          or Save. A journal names the content that it continues, so a journal that an interrupted save left behind
+//          is not applied twice.
+// Fails:   returns a message and loses nothing. The next Append writes the splices that could not be appended. A page
 //          that could not be saved is still in its file and journal.
 #pragma once
 
@@ -16,7 +16,7 @@
 
 namespace Moka::Notebook {
 
-// A page's name while a window has it, on this machine: the next window that asks finds it taken.
+// Locks a page's path for one process of this machine.
 class PageLock {
 public:
     explicit PageLock(std::string const& path);
@@ -24,7 +24,8 @@ public:
     PageLock(PageLock const&) = delete;
     PageLock& operator=(PageLock const&) = delete;
 
-    bool IsTaken() const { return mIsTaken; } // by another one
+    // True if another PageLock holds the path.
+    bool IsTaken() const { return mIsTaken; }
 
 private:
     int const mSocket;
@@ -35,34 +36,34 @@ class PageStore {
 public:
     struct Opened {
         Objects objects;
-        std::vector<std::string> problems; // of the file or its journal: it must not be replaced
-        bool hasUnsaved = false;           // the journal held something
+        std::vector<std::string> problems; // not empty if the file must not be replaced
+        bool hasUnsaved = false;           // the journal contained splices
     };
     // A file that does not exist is an empty page.
     Opened Open(std::string const& path);
 
     struct Report {
         bool hasFailed = false;
-        std::string message{}; // empty for an autosave that went well
+        std::string message{}; // empty for a successful autosave
         bool isSave = false;
         std::string path{};      // of a save
-        std::uint64_t bytes = 0; // put into the journal
+        std::uint64_t bytes = 0; // appended to the journal
         bool isJournalLong = false;
-        double milliseconds = 0; // of whoever measures
+        double milliseconds = 0; // set by the caller
     };
     Report Append(std::vector<Splice> const& splices);
-    // Writes a journal that is longer than 4 MiB and twice the page anew: the page as it is, without the way there.
+    // Replaces a journal longer than 4 MiB and twice the page by one splice with the current objects.
     Report Shorten(Objects const& objects);
-    // Under another path the page goes on there.
+    // If path is another one, it becomes the page's path.
     Report Save(Objects const& objects, int height, std::string const& path);
 
 private:
     std::string mPath;
     std::uint64_t mFingerprint = 0; // of the page's file
-    std::size_t mPageObjects = 0;   // in it
+    std::size_t mPageObjects = 0;   // the number of objects in the page's file
     std::uint64_t mWholeBytes = 0;  // of the page when it was last written or read whole
     std::uint64_t mJournalBytes = 0;
-    std::string mWaiting; // to be appended
+    std::string mWaiting; // the text that the next Append writes
 };
 
 } // namespace Moka::Notebook

@@ -38,7 +38,7 @@ void Painter::Draw(IMKCanvas& canvas, Object const& object) const {
     canvas.Draw(mInk.Get(), &paint);
 }
 
-// A frame stands for an image that is not there yet, one with a cross for an image that cannot be read.
+// Draws a frame while the image is loading, and a frame with a cross if it could not be read.
 void Painter::DrawImage(IMKCanvas& canvas, Image const& image) const {
     if (IMKBitmap* const bitmap = mImages.Get(image.file)) {
         MKPaint const paint;

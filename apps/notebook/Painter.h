@@ -1,7 +1,7 @@
 // Painter: draws the page's objects onto canvases whose units are the page's pixels.
-// Thread: the window's; the drawing itself is posted.
-// Memory: the page holds the strokes; the GPU has one's points only while it is written or drawn onto a canvas. One
-//         drawable takes all of them in turn, so that the render thread allocates nothing for a stroke once warm.
+// Thread: the window's; draws are posted to the render thread.
+// Memory: one drawable draws all strokes one after the other and reuses its memory. So the render thread does not
+//         allocate for strokes after the first frames.
 #pragma once
 
 #include "apps/notebook/Images.h"
@@ -26,7 +26,7 @@ class Painter {
 public:
     Painter(Page const& page, Images& images, IGLMsgQueue& queue);
 
-    // Objects of the area, the lowest first, without those that are hidden.
+    // Returns the objects that overlap the area, the lowest first, without the hidden ones.
     Objects Find(RectF const& area) const;
     void Draw(IMKCanvas& canvas, Object const& object) const;
 

@@ -7,10 +7,10 @@ namespace Moka::Notebook {
 namespace {
 
 constexpr float kStep = 2.5f;
-constexpr float kNearest = 0.25f; // positions closer together say nothing of the direction
+constexpr float kNearest = 0.25f; // closer positions do not determine a direction
 constexpr float kWidthGain = 0.3f;
 constexpr float kSpeedGain = 0.6f;
-constexpr std::uint32_t kRest = 60; // after so long without a position the pen rests: no prediction
+constexpr std::uint32_t kRest = 60; // milliseconds without a position after which nothing is predicted
 
 InkPoint MakePoint(float x, float y, float width) {
     return {RoundForFile(x), RoundForFile(y), RoundForFile(width)};
@@ -51,8 +51,8 @@ void PenPath::Add(float x, float y, std::uint32_t time, float pressure) {
     ++mCount;
 }
 
-// Barry and Goldman's pyramid, its knots the square roots of the distances. Doubled ends make the first and the
-// last segment.
+// Barry and Goldman's algorithm with the square roots of the distances as knots. The first and the last segment use
+// their end point twice.
 void PenPath::AddCurve(Position const (&p)[4], InkPoints& to) {
     float knots[4] = {0, 0, 0, 0};
     for (int i = 1; i < 4; ++i)
@@ -67,7 +67,7 @@ void PenPath::AddCurve(Position const (&p)[4], InkPoints& to) {
         float y[4] = {p[0].y, p[1].y, p[2].y, p[3].y};
         for (int level = 1; level < 4; ++level) {
             for (int k = 0; k + level < 4; ++k) {
-                // The last level mixes between the middle knots alone.
+                // The last level interpolates between the middle knots.
                 int const low = level == 3 ? 1 : k;
                 int const high = level == 3 ? 2 : k + level;
                 float const mix = (t - knots[low]) / (knots[high] - knots[low]);

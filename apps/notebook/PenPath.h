@@ -1,6 +1,6 @@
-// PenPath: makes a stroke of a pen's reported positions: a centripetal Catmull-Rom curve through them, which has
-// no loops and no cusps between two positions, in steps of about 2.5 pixels, with a width from pressure or speed.
-// A segment is settled once the position after it is known; until then the tail stands for it.
+// PenPath: converts the reported positions of a pen to a stroke: a centripetal Catmull-Rom curve, which has no loops and
+// no cusps between two positions, in steps of about 2.5 pixels. Pressure or speed determines the width.
+// A segment is settled when the position after it is known; until then it belongs to the tail.
 // Units: page pixels; milliseconds.
 #pragma once
 
@@ -12,18 +12,18 @@ namespace Moka::Notebook {
 
 class PenPath {
 public:
-    // A plain path has the same width everywhere.
+    // A plain path has a constant width.
     PenPath(float width, bool isPlain) : mBase(width), mIsPlain(isPlain) {}
 
-    // Pressure is 0 ... 1, or negative where nothing is known of it.
+    // Pressure is 0 to 1, or negative if it is unknown.
     void Add(float x, float y, std::uint32_t time, float pressure);
 
-    // Only ever appended to.
+    // Later calls of Add only append points.
     InkPoints const& GetSettled() const { return mSettled; }
-    // From the last settled point to the last position, and on to where the pen will be `ahead` milliseconds
-    // later if it goes on as it went.
+    // Returns the curve from the last settled point to the last position, and on to the position predicted `ahead`
+    // milliseconds later from the pen's speed.
     InkPoints GetTail(float ahead) const;
-    // The whole stroke, once the pen is up.
+    // Returns the whole stroke. Call this when the pen is up.
     InkPoints Finish() const;
 
 private:

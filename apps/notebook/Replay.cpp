@@ -11,9 +11,9 @@
 namespace Moka::Notebook {
 namespace {
 
-constexpr char kIdle[] = "idle"; // waits until the window has nothing to do
+constexpr char kIdle[] = "idle"; // waits until the window is idle
 
-// A number of an event: where it stands, and its type.
+// A number of an event: its offset in SDL_Event and its type.
 struct Field {
     std::size_t at;
     enum Type { None, Byte, Short, Int, Long, Float } type;
@@ -51,7 +51,7 @@ constexpr Word kWords[] = {
 };
 #undef AT
 
-// Null for a word that is none.
+// Returns null for an unknown word.
 template <class Matches>
 Word const* FindWord(Matches const& matches) {
     auto const* const found = std::find_if(std::begin(kWords), std::end(kWords), matches);
@@ -78,7 +78,7 @@ void Visit(SDL_Event& event, Field const& field, Function const& function) {
     }
 }
 
-// What stands behind the word.
+// Returns the text after the word.
 std::string Describe(Word const& word, SDL_Event event) {
     if (event.type == SDL_TEXTINPUT) return event.text.text;
     if (event.type == SDL_DROPFILE) return event.drop.file ? event.drop.file : "";
@@ -87,7 +87,7 @@ std::string Describe(Word const& word, SDL_Event event) {
     return out.str();
 }
 
-// False if there are too few numbers.
+// Returns false if there are too few numbers.
 bool Fill(Word const& word, SDL_Event& event, std::string const& rest) {
     event.type = word.type;
     if (word.type == SDL_TEXTINPUT)
@@ -112,7 +112,7 @@ void Recorder::Add(SDL_Event const& event) {
     if (!mFile || !word) return;
     std::fprintf(mFile.get(), "%u %s %s\n", event.common.timestamp - mStart, word->name,
                  Describe(*word, event).c_str());
-    std::fflush(mFile.get()); // a session that crashes is the one to replay
+    std::fflush(mFile.get()); // a recording must survive a crash
 }
 
 bool Replay::Load(std::string const& path, std::string& reason) {
@@ -130,7 +130,7 @@ bool Replay::Load(std::string const& path, std::string& reason) {
         Word const* const word = FindWord([&](Word const& w) { return w.name == name; });
         line.isIdle = name == kIdle;
         isGood = isGood && (word ? Fill(*word, line.event, line.rest) : line.isIdle);
-        if (!isGood) return reason = path + ':' + std::to_string(number) + ": no event: " + text, false;
+        if (!isGood) return reason = path + ':' + std::to_string(number) + ": unknown event: " + text, false;
         mLines.push_back(std::move(line));
     }
     return true;
@@ -145,7 +145,7 @@ int Replay::Pump(bool isIdle) {
         if (line.isIdle) {
             if (!isIdle) return 10;
             mStart = now - line.time;
-            isIdle = false; // what follows may be something to do
+            isIdle = false; // later events may need work
             continue;
         }
         auto const wait = static_cast<std::int32_t>(mStart + line.time - now);
@@ -153,7 +153,7 @@ int Replay::Pump(bool isIdle) {
         SDL_Event event = line.event;
         event.common.timestamp = mStart + line.time;
         if (event.type == SDL_DROPFILE) event.drop.file = SDL_strdup(line.rest.c_str());
-        // Not SDL_PushEvent, which replaces the time.
+        // SDL_PushEvent would replace the timestamp.
         SDL_PeepEvents(&event, 1, SDL_ADDEVENT, event.type, event.type);
     }
     return -1;

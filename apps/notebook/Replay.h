@@ -1,6 +1,6 @@
-// Replay: input as a text file, one event a line: milliseconds from the start, a word, numbers. A recorder writes
-// what came; a replay hands it to SDL's queue again, at the times of the file and with them, so that what depends on
-// speed comes out the same. docs/notebook.md lists the words.
+// Replay: records input in a text file and replays it. Each line is an event: milliseconds from the start, a word,
+// numbers. Replay pushes the events into SDL's queue at the recorded times and with these timestamps, so that strokes
+// whose width depends on speed are reproduced. docs/notebook.md lists the words.
 // Thread: the window's.
 #pragma once
 
@@ -15,7 +15,7 @@ namespace Moka::Notebook {
 
 class Recorder {
 public:
-    // Empty: nothing is recorded.
+    // An empty path records nothing.
     explicit Recorder(std::string const& path);
     bool IsOpen() const { return mFile != nullptr; }
     void Add(SDL_Event const& event);
@@ -30,11 +30,11 @@ private:
 
 class Replay {
 public:
-    // False, with the line in the reason, if the file is none.
+    // Returns false and sets reason, with the line, if the file is not a recording.
     bool Load(std::string const& path, std::string& reason);
 
-    // Hands over what is due. isIdle: all that was asked for is drawn, loaded and written. Returns the milliseconds
-    // until more is due, or -1.
+    // Pushes the events that are due. isIdle: everything requested has been drawn, loaded and written. Returns the
+    // milliseconds until the next event is due, or -1.
     int Pump(bool isIdle);
     bool IsActive() const { return mNext < mLines.size(); }
 
@@ -43,13 +43,13 @@ private:
         std::uint32_t time = 0;
         SDL_Event event{};
         bool isIdle = false;
-        std::string rest; // behind the word
+        std::string rest; // the text after the word
     };
 
     std::vector<Line> mLines;
     std::size_t mNext = 0;
     bool mIsStarted = false;
-    std::uint32_t mStart = 0; // of the file's time, in SDL's
+    std::uint32_t mStart = 0; // SDL's time at time 0 of the file
 };
 
 } // namespace Moka::Notebook

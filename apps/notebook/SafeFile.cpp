@@ -18,14 +18,14 @@ struct Close {
 };
 using File = std::unique_ptr<std::FILE, Close>;
 
-// Null with errno set. Nothing is held back for later: what a failed write leaves is known.
+// Returns null and sets errno on failure. The file has no buffer, so a failed write leaves no data to be written later.
 File Open(std::string const& path, char const* mode) {
     File file(std::fopen(path.c_str(), mode));
     if (file) std::setvbuf(file.get(), nullptr, _IONBF, 0);
     return file;
 }
 
-// False with errno set.
+// Returns false and sets errno on failure.
 bool WriteToDisk(File const& file, std::string_view text) {
     return std::fwrite(text.data(), 1, text.size(), file.get()) == text.size() &&
            fdatasync(fileno(file.get())) == 0;
@@ -44,7 +44,7 @@ std::string ReplaceFile(std::string const& path, std::string_view text) {
     file.reset();
     if (reason.empty() && rename(draft.c_str(), path.c_str()) != 0) reason = Explain();
     if (!reason.empty()) unlink(draft.c_str());
-    // The new name, too, outlives a power cut.
+    // Flush the folder, so that the new name survives a power cut.
     File const folder = Open((std::filesystem::path(path).parent_path() / ".").string(), "re");
     if (folder) fsync(fileno(folder.get()));
     return reason;
@@ -58,7 +58,7 @@ std::string AppendToFile(std::string const& path, std::string_view text) {
     if (WriteToDisk(file, text)) return {};
     std::string const reason = Explain();
     bool const isCut = isSized && ftruncate(fileno(file.get()), before.st_size) == 0;
-    return isCut ? reason : reason + ", and a part of a line is left in the file";
+    return isCut ? reason : reason + ", and the file ends with an incomplete line";
 }
 
 bool ReadFile(std::string const& path, std::string& text, std::string& reason) {

@@ -1,5 +1,5 @@
-// SafeFile.h: files that are replaced whole or not at all, and files that only grow.
-// Fails: with the system's reason in words, empty when all is well.
+// SafeFile.h: replaces files atomically, and appends to files.
+// Fails: returns the system's error message, or an empty string on success.
 #pragma once
 
 #include <cstdint>
@@ -8,16 +8,16 @@
 
 namespace Moka::Notebook {
 
-// Into a new file beside it, flushed to the disk, then renamed. A failure leaves the old file.
+// Writes a new file beside path, flushes it to the disk and renames it. A failure keeps the old file.
 std::string ReplaceFile(std::string const& path, std::string_view text);
 
-// Missing files are made. A failure leaves the file as long as it was.
+// Creates the file if it is missing. A failure restores the file's length.
 std::string AppendToFile(std::string const& path, std::string_view text);
 
-// False when it does not exist; a file that cannot be read is a reason.
+// Returns false if the file does not exist. Sets reason if it cannot be read.
 bool ReadFile(std::string const& path, std::string& text, std::string& reason);
 
-// Tells contents apart.
+// Returns a hash of the text.
 std::uint64_t Fingerprint(std::string_view text);
 
 } // namespace Moka::Notebook

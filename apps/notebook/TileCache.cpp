@@ -7,13 +7,13 @@
 namespace Moka::Notebook {
 namespace {
 
-// What a frame draws, in points of strokes; an object counts kObject more.
+// The budget of a frame in points of strokes. Each object costs kObject more.
 constexpr double kLeastBudget = 600;
 constexpr double kMostBudget = 200'000;
 constexpr double kObject = 20;
-constexpr int kAhead = 2 * TileCache::kSide; // of the window's pixels, drawn before they are seen
+constexpr int kAhead = 2 * TileCache::kSide; // window pixels beyond the view that are drawn in advance
 
-// The part of a tile that is page: those on the right and at the bottom reach over its edge.
+// The part of a tile that lies on the page: tiles at the right and bottom extend beyond its edge.
 int GetExtent(int index, int whole) {
     return std::clamp(whole - index * TileCache::kSide, 0, TileCache::kSide);
 }
@@ -51,7 +51,7 @@ bool TileCache::Draw(IMKCanvas& screen, Viewport const& view, int pageHeight, bo
     return isDone;
 }
 
-// Where there are no tiles yet.
+// Fills the page, for areas without tiles.
 void TileCache::ShowPaper(IMKCanvas& screen, Viewport const& view, int pageHeight) {
     MKPaint const paper = MakePaint(kPaper);
     float const left = ToFloat(-view.x);
@@ -88,7 +88,7 @@ void TileCache::AddPlaces(Viewport const& view, int pageHeight, std::vector<Plac
                 places.emplace_back(column, row);
 }
 
-// What is seen, and behind it what comes next.
+// Returns the visible tiles, followed by those in the scroll direction.
 std::vector<TileCache::Place> TileCache::FindWanted(Viewport const& view, int pageHeight) {
     std::vector<Place> wanted;
     AddPlaces(view, pageHeight, wanted);
@@ -108,7 +108,7 @@ std::vector<TileCache::Place> TileCache::FindWanted(Viewport const& view, int pa
     return wanted;
 }
 
-// A frame draws more or less than the one before, until it takes about kFrameTime.
+// Changes the budget until a frame takes about kFrameTime.
 void TileCache::Adapt(double lastFrame) {
     if (lastFrame > 1.2 * kFrameTime) mBudget = std::max(mBudget * 0.7, kLeastBudget);
     if (lastFrame < 0.9 * kFrameTime && mIsSpent) mBudget = std::min(mBudget * 1.2, kMostBudget);
@@ -120,7 +120,7 @@ bool TileCache::Fill(std::vector<Place> const& wanted) {
         auto const found = mNow.tiles.find(place);
         if (found != mNow.tiles.end()) found->second.seen = mFrame;
     }
-    // Out of sight before it was done.
+    // Drops the draft if its tile is no longer visible.
     if (mDraft && std::find(wanted.begin(), wanted.end(), mDraft->place) == wanted.end()) mDraft.reset();
     double budget = mBudget;
     while (budget > 0 && (mDraft || Begin(wanted))) budget -= Continue(budget);
@@ -141,7 +141,7 @@ bool TileCache::Begin(std::vector<Place> const& wanted) {
     return true;
 }
 
-// Returns what it took of the budget.
+// Returns the cost.
 double TileCache::Continue(double budget) {
     double cost = kObject;
     for (; mDraft->next < mDraft->objects.size() && cost < budget; ++mDraft->next) {

@@ -1,13 +1,13 @@
-// TileCache: the page's pixels at one zoom, in square bitmaps of one strip each, drawn when they are seen first and
-// again when what is on them has changed. While the zoom changes, the tiles of the zoom before are shown scaled.
-// One strip: a custom drawable is clipped rightly there.
-// Owner:   the application; destroyed before its queue.
+// TileCache: the page's pixels at one zoom, in square tiles. A tile is drawn when it is first visible, and redrawn when
+// an object on it has changed. While the zoom changes, the tiles of the previous zoom are shown scaled.
+// Each tile is a bitmap of one strip, because scissor clips of custom drawables are correct only there.
+// Owner:   the application, which destroys it before its queue.
 // Thread:  the window's.
-// Memory:  kTileBytes a tile, the limit in all; raised to what the window needs. The tile longest unseen is used
-//          anew.
-// Cost:    a frame draws as much as fits into about kFrameTime, by what the frames before took. A tile is drawn aside,
-//          over several frames if need be, and then shown whole; until then paper, its old pixels, or those of the
-//          zoom before are seen. What is seen comes first, then what comes into view if it moves on as it did.
+// Memory:  kTileBytes for each tile. The limit is raised to the number of visible tiles. At the limit, the tile that was
+//          invisible for the longest time is reused.
+// Cost:    each frame draws for about kFrameTime, estimated from the times of earlier frames. A tile is drawn off
+//          screen, over several frames if necessary; until it is complete, the window shows paper, its old pixels, or
+//          those of the previous zoom. Visible tiles are drawn first, then those in the direction of the last scroll.
 #pragma once
 
 #include "apps/notebook/Painter.h"
@@ -32,11 +32,11 @@ public:
     TileCache(IGLMsgQueue& queue, std::size_t limitBytes, Painter const& painter)
         : mQueue(queue), mPainter(painter), mLimit(limitBytes / kTileBytes) {}
 
-    // Shows the view. isZooming: the tiles of the zoom before stay for now. lastFrame: the milliseconds it took.
-    // True when all that is seen, or will be soon, is as it should be.
+    // Draws the view. isZooming: keep the tiles of the previous zoom for now. lastFrame: the duration of the last frame
+    // in milliseconds. Returns true if all visible tiles, and those in the scroll direction, are up to date.
     bool Draw(IMKCanvas& screen, Viewport const& view, int pageHeight, bool isZooming, double lastFrame);
 
-    // What is on the area has changed, or (Add) the object has come on top.
+    // Call Invalidate when objects in the area have changed, and Add when the object was put on top.
     void Invalidate(RectF const& area);
     void Add(ObjectPtr const& object);
     void Clear();
@@ -48,19 +48,19 @@ private:
     struct Tile {
         RefPtr<IMKBitmap> bitmap;
         RefPtr<IMKCanvas> canvas;
-        bool isStale = false;   // to be drawn again
-        std::uint64_t seen = 0; // the frame
+        bool isStale = false;   // must be redrawn
+        std::uint64_t seen = 0; // the last frame in which it was visible
     };
     struct Level {
         double zoom = 1;
-        std::map<Place, Tile> tiles; // drawn whole
+        std::map<Place, Tile> tiles; // complete ones
 
         RectF GetPageArea(Place const& place) const;
     };
     struct Draft {
         Place place;
         Objects objects;
-        std::size_t next = 0; // of them
+        std::size_t next = 0; // the index of the next object to draw
         bool isStale = false;
     };
 
@@ -82,15 +82,15 @@ private:
     IGLMsgQueue& mQueue;
     Painter const& mPainter;
     std::size_t const mLimit; // tiles
-    std::size_t mNeeded = 0;  // tiles of the view
+    std::size_t mNeeded = 0;  // the number of visible tiles
     Level mNow;
-    Level mBefore;               // shown where mNow has nothing yet
+    Level mBefore;               // the previous zoom, shown where mNow has no tile yet
     Tile mSpare;                 // the draft is drawn on it
     std::optional<Draft> mDraft; // of mNow
-    double mBudget = 2000;       // of a frame, in points of strokes
+    double mBudget = 2000;       // for a frame, in points of strokes
     bool mIsSpent = false;
     int mLast[2] = {0, 0};      // the view's corner in the last frame
-    int mDirection[2] = {0, 1}; // in which it moved last
+    int mDirection[2] = {0, 1}; // of its last movement
     std::uint64_t mFrame = 0;
 };
 

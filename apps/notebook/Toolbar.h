@@ -1,4 +1,4 @@
-// Toolbar: the row of buttons above the page, drawn by the library, and what buttons and keys command.
+// Toolbar: the row of buttons above the page, and the commands of buttons and keys.
 // Units: the window's pixels.
 #pragma once
 
@@ -11,7 +11,7 @@ namespace Moka::Notebook {
 
 enum class Command {
     None,
-    Choose, // a tool, by its number
+    Choose, // the value is the number of a tool
     SetColor,
     SetWidth,
     Undo,
@@ -25,11 +25,11 @@ enum class Command {
     Delete,
     Escape,
     Quit,
-    ZoomBy, // so many hundredths
+    ZoomBy, // the value is the factor in hundredths
     ZoomOne,
-    ScrollAcross, // by so many pixels
+    ScrollAcross, // the value is in pixels
     ScrollDown,
-    ScrollPages // by so many tenths of what is seen
+    ScrollPages // the value is in tenths of the view's height
 };
 
 struct Action {
@@ -44,7 +44,7 @@ public:
     Toolbar();
 
     Action Find(float x) const;
-    // status stands at the right.
+    // status is drawn at the right.
     void Draw(IMKCanvas& canvas, int width, Tools const& tools, Page const& page,
               std::string const& status) const;
 

@@ -6,8 +6,8 @@
 namespace Moka::Notebook {
 namespace {
 
-constexpr float kHandle = 7;      // of the window's pixels
-constexpr float kTap = 4;         // a lasso smaller than this picks what is under it
+constexpr float kHandle = 7;      // window pixels
+constexpr float kTap = 4;         // a smaller lasso is a tap, which selects the object under it
 constexpr float kHighlighter = 6; // times the pen's width
 constexpr float kSmallestScale = 0.05f;
 constexpr unsigned kMark = 0xFF2F7DD1;
@@ -87,7 +87,7 @@ void Tools::Cancel() {
 void Tools::Erase(PointF to, double zoom) {
     Swipe const swipe{mLast, to, kEraserRadius / static_cast<float>(zoom)};
     std::vector<std::size_t> const found = mPage.Find(swipe.GetBounds());
-    // From the top, so that the positions below stay.
+    // From the top, so that the indices below stay valid.
     std::for_each(found.rbegin(), found.rend(), [&](std::size_t i) { EraseFrom(i, swipe); });
 }
 
@@ -127,7 +127,7 @@ bool Tools::BeginDrag(PointF at, double zoom) {
 Placement Tools::GetPlacement() const {
     if (mDrag == Drag::Move) return {1, mLast.x - mFirst.x, mLast.y - mFirst.y};
     if (mDrag != Drag::Scale) return {};
-    // About the top left corner, by what the drag adds along the diagonal.
+    // Scale about the top left corner, by the drag's component along the diagonal.
     RectF const bounds = GetSelectedBounds();
     float const w = std::max(bounds.GetWidth(), 1.0f);
     float const h = std::max(bounds.GetHeight(), 1.0f);
@@ -167,7 +167,7 @@ void Tools::SelectInside() {
                           : isTap         ? Contains(b, mFirst)
                                           : IsInside(mLasso, (b.left + b.right) / 2, (b.top + b.bottom) / 2);
         if (!isIn) continue;
-        if (isTap) mSelected.clear(); // the topmost alone
+        if (isTap) mSelected.clear(); // select only the topmost
         mSelected.push_back(object);
     }
 }
@@ -183,7 +183,7 @@ void Tools::DeleteSelected() {
     mSelected.clear();
 }
 
-// Opaque ink may lie over itself, so only what is new goes to the GPU. Translucent ink is one stroke, tail and all.
+// Opaque ink may overlap itself, so only new points are appended. Translucent ink must be one stroke with its tail.
 void Tools::DrawLive(IMKCanvas& canvas, float ahead) {
     for (RefPtr<MKStrokeDrawable>* const ink : {&mLive, &mTail})
         if (!*ink) *ink = RefPtr<MKStrokeDrawable>::Adopt(new MKStrokeDrawable(canvas.GetMsgQueue()));

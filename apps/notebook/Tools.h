@@ -1,6 +1,7 @@
-// Tools: what the pen does to the page: writing, erasing, selecting, moving and scaling.
+// Tools: the tools of the pen: writing, erasing, selecting, moving and scaling.
 // Thread: the window's.
-// Units:  page pixels; `zoom` is how many of the window's pixels one has, for what is aimed at by hand.
+// Units:  page pixels. `zoom` is the number of window pixels for a page pixel; handles and erasers have a constant size
+//         in the window.
 #pragma once
 
 #include "apps/notebook/Painter.h"
@@ -21,7 +22,7 @@ public:
 
     void Choose(Tool tool);
     Tool GetTool() const { return mTool; }
-    // Of the tool that is chosen: the highlighter has a colour of its own.
+    // The colour of the current tool: the highlighter has its own.
     void SetColor(unsigned rgb) { (mTool == Tool::Highlighter ? mHighlight : mColor) = rgb; }
     unsigned GetColor() const { return mTool == Tool::Highlighter ? mHighlight : mColor; }
     void SetWidth(float width) { mWidth = width; }
@@ -31,17 +32,18 @@ public:
     void Down(PointF at, std::uint32_t time, float pressure, double zoom);
     void Move(PointF at, std::uint32_t time, float pressure, double zoom);
     void Up();
-    void Cancel(); // as if the pen had not come down
+    void Cancel(); // undoes everything since Down
     bool IsDown() const { return mIsDown; }
 
     void Select(Objects objects) { mSelected = std::move(objects); }
     bool HasSelection() const { return !mSelected.empty(); }
     RectF GetSelectedBounds() const;
     void DeleteSelected();
-    // The selection while it is dragged, which the tiles do not show; where it was when the drag began.
+    // True while the selection is dragged. The tiles do not show it then.
     bool IsDragging() const { return mDrag != Drag::None; }
 
-    // What is not on the tiles: the live stroke, on to `ahead` milliseconds from now, the lasso, the selection.
+    // Draws everything that is not on the tiles: the live stroke, predicted `ahead` milliseconds, the lasso, and the
+    // selection.
     void Draw(IMKCanvas& canvas, double zoom, float ahead);
 
 private:
@@ -68,9 +70,9 @@ private:
     PointF mFirst;
     PointF mLast;
     std::optional<PenPath> mPath;
-    RefPtr<MKStrokeDrawable> mLive; // what is settled of it
-    RefPtr<MKStrokeDrawable> mTail; // and the rest, anew in each frame
-    std::size_t mLiveCount = 0;     // points
+    RefPtr<MKStrokeDrawable> mLive; // the settled points of mPath
+    RefPtr<MKStrokeDrawable> mTail; // its tail, which each frame replaces
+    std::size_t mLiveCount = 0;     // points of mLive
     std::vector<PointF> mLasso;
     Objects mSelected;
     Drag mDrag = Drag::None;

@@ -1,5 +1,5 @@
-// Viewport: which part of the page the window shows. The page's corner lies on a whole pixel of the window, so
-// that tiles are copied pixel by pixel.
+// Viewport: the part of the page that the window shows. The page's corner lies on a whole pixel of the window, so that
+// tiles are copied pixel by pixel.
 // Units: the window's pixels, unless a name says page.
 #pragma once
 
@@ -14,13 +14,13 @@ namespace Moka::Notebook {
 struct Viewport {
     static constexpr double kMinZoom = 0.1;
     static constexpr double kMaxZoom = 8;
-    static constexpr int kEdge = 24; // that may be seen beside the page
+    static constexpr int kEdge = 24; // the margin beside the page that may be visible
 
     double zoom = 1;
-    int x = 0; // of the view's corner on the page, scaled
+    int x = 0; // the view's corner on the scaled page
     int y = 0;
     int width = 1;
-    int height = 1; // of the view, below the toolbar
+    int height = 1; // the view's height, without the toolbar
     int top = 0;    // the toolbar's height
 
     PointF ToPage(PointF const& at) const {
@@ -34,7 +34,7 @@ struct Viewport {
     }
     int Scale(int page) const { return static_cast<int>(std::ceil(page * zoom)); }
 
-    // The canvas's units become the page's.
+    // Sets the canvas's matrix, so that its units are page pixels.
     void Apply(IMKCanvas& canvas) const {
         canvas.PreTranslate(static_cast<float>(-x), static_cast<float>(top - y));
         if (zoom != 1) canvas.PreScale(static_cast<float>(zoom), static_cast<float>(zoom));
@@ -44,7 +44,7 @@ struct Viewport {
         x -= static_cast<int>(std::lround(dx));
         y -= static_cast<int>(std::lround(dy));
     }
-    // What is there stays there.
+    // Scales the view; the point of the page at `at` does not move.
     void ZoomAt(PointF const& at, double factor) {
         double const before = zoom;
         zoom = std::clamp(zoom * factor, kMinZoom, kMaxZoom);
@@ -55,7 +55,7 @@ struct Viewport {
         x = static_cast<int>(std::lround((x + across) * ratio - across));
         y = static_cast<int>(std::lround((y + down) * ratio - down));
     }
-    // Keeps the page in the view; one that is narrower lies in the middle.
+    // Keeps the page in the view. A page that is narrower than the view is centred.
     void Clamp(int pageHeight) {
         int const pageWidth = Scale(Page::kWidth);
         x = pageWidth + 2 * kEdge <= width ? (pageWidth - width) / 2

@@ -1,5 +1,5 @@
-// moka-notebook: a page that one writes on. Exit status: 0 closed, 1 failed, 2 wrong usage; what fails before there
-// is a window is one line on stderr.
+// moka-notebook: a window with a page to write on. Exit status: 0 if the window was closed, 1 after an error, 2 for wrong
+// usage. An error before the window opens is printed to stderr as one line.
 #include "apps/notebook/Notebook.h"
 #include "moka/base/Version.h"
 #include "moka/base/log/AndroidLog.h"
@@ -18,8 +18,7 @@ using namespace Moka;
 using Moka::Notebook::Options;
 
 constexpr char kDescription[] = "Write on a page with a pen, a finger or the mouse.";
-constexpr char kFooter[] =
-    "docs/notebook.md tells what keys do. Exit status: 0 closed, 1 failed, 2 wrong usage.";
+constexpr char kFooter[] = "docs/notebook.md lists the keys. Exit status: 0 closed, 1 failed, 2 wrong usage.";
 
 int Fail(std::string const& message) {
     return std::fprintf(stderr, "moka-notebook: %s\n", message.c_str()), 1;
@@ -36,9 +35,10 @@ bool GetNativeWindow(SDL_Window* window, RenderThreadOptions& options) {
 
 int RunInWindow(Options const& options, SDL_Window* window) {
     RenderThreadOptions settings;
-    settings.framesInFlight = 1; // for ink
+    settings.framesInFlight = 1; // for the lowest latency of ink
     settings.tracePath = options.trace;
-    if (!GetNativeWindow(window, settings)) return Fail("this is no X11 window; set SDL_VIDEODRIVER=x11");
+    if (!GetNativeWindow(window, settings))
+        return Fail("the window is not an X11 window; set SDL_VIDEODRIVER=x11");
     std::string error;
     auto const queue = RenderThread::Start(settings, &error);
     if (!queue) return Fail(error);
@@ -51,7 +51,7 @@ int Run(Options const& options) {
     SDL_SetHint(SDL_HINT_MOUSE_FOCUS_CLICKTHROUGH, "1");
     SDL_SetHint(SDL_HINT_VIDEODRIVER, "x11");
     if (SDL_Init(SDL_INIT_VIDEO) != 0)
-        return Fail(std::string("no window can be made: ") + SDL_GetError() + "; is DISPLAY set?");
+        return Fail(std::string("cannot open a window: ") + SDL_GetError() + "; is DISPLAY set?");
     SDL_Window* const window =
         SDL_CreateWindow("moka-notebook", SDL_WINDOWPOS_UNDEFINED, SDL_WINDOWPOS_UNDEFINED, options.width,
                          options.height, SDL_WINDOW_RESIZABLE);
@@ -61,21 +61,21 @@ int Run(Options const& options) {
     return status;
 }
 
-// The exit status, or -1 to go on.
+// Returns the exit status, or -1 to continue.
 int Parse(CLI::App& app, Options& options, int argc, char** argv) {
     app.footer(kFooter);
     app.set_version_flag("--version", "moka-notebook " MOKA_VERSION);
     app.add_option("PAGE", options.page,
-                   "The page's file, made if it does not exist; the last one unless given");
-    app.add_option("--autosave", options.autosave,
-                   "Seconds of change after which it is saved; 10 unless given")
+                   "The page's file, created if it does not exist; default: the last page");
+    app.add_option("--autosave", options.autosave, "Seconds from a change to its autosave; default: 10")
         ->check(CLI::Range(0.01, 3600.0));
-    app.add_option("--cache", options.cache, "MiB for the pixels of the page; 96 unless given")
+    app.add_option("--cache", options.cache, "Memory for the pixels of the page, in MiB; default: 96")
         ->check(CLI::Range(16, 4096));
-    app.add_option("--width", options.width, "Of the window, in pixels")->check(CLI::Range(200, 16384));
-    app.add_option("--height", options.height, "Of the window, in pixels")->check(CLI::Range(150, 16384));
-    app.add_option("--record", options.record, "Write all input into a file")->type_name("FILE");
-    app.add_option("--replay", options.replay, "Take input from such a file")->type_name("FILE");
+    app.add_option("--width", options.width, "Width of the window in pixels")->check(CLI::Range(200, 16384));
+    app.add_option("--height", options.height, "Height of the window in pixels")
+        ->check(CLI::Range(150, 16384));
+    app.add_option("--record", options.record, "Record all input in a file")->type_name("FILE");
+    app.add_option("--replay", options.replay, "Replay a recorded file")->type_name("FILE");
     app.add_option("--trace", options.trace, "Write a trace for Perfetto")->type_name("FILE");
     app.add_flag("--statistics", options.statistics, "Print times and sizes at the end");
     try {
@@ -90,7 +90,7 @@ int Parse(CLI::App& app, Options& options, int argc, char** argv) {
 } // namespace
 
 int main(int argc, char** argv) {
-    std::signal(SIGXFSZ, SIG_IGN); // a file that may not grow is an error of its own
+    std::signal(SIGXFSZ, SIG_IGN); // so that a write over the file size limit returns an error
     SetLogPriority(ANDROID_LOG_ERROR);
     MKBitmapFactory_UseNativeDecoder();
     try {

@@ -1,5 +1,5 @@
-// The notebook as a person uses it: what the window shows is what its page's file draws, after writing,
-// highlighting, erasing, undoing, dropping an image, scrolling, zooming, saving, closing, opening and a kill.
+// Tests that the notebook's window shows the same pixels as `moka draw` of the page's file, after writing, highlighting,
+// erasing, undo, dropping an image, scrolling, zooming, saving, closing, opening and a kill.
 #include "moka/base/Point.h"
 #include "tests/app/MokaProcess.h"
 #include "tests/examples/ExampleWindow.h"
@@ -28,11 +28,11 @@ constexpr int kEdge = 24;
 constexpr int kPage = 1200;
 constexpr int kView = kHeight - kToolbar;
 constexpr int kWheelStep = 80;
-constexpr int kControl = 64; // as SDL numbers them
+constexpr int kControl = 64; // SDL's number
 constexpr int kShift = 1;
-constexpr int kImageSlack = 1; // a scaled image is sampled from a tile's corner or from the page's
+constexpr int kImageSlack = 1; // the window samples a scaled image relative to a tile's corner
 
-// For some seconds: the sanitizers and a busy machine take their time.
+// Waits up to some seconds, because sanitizers and a busy machine are slow.
 template <class Condition>
 bool Soon(Condition const& holds) {
     for (int i = 0; i < 800; ++i) {
@@ -46,7 +46,7 @@ bool Soon(Condition const& holds) {
 class Script {
 public:
     void Add(std::string const& event) { mText += std::to_string(mTime) + ' ' + event + '\n'; }
-    // A finger that presses harder and harder; points are the window's pixels.
+    // Draws with a finger whose pressure increases. The points are in window pixels.
     void Touch(std::vector<PointF> const& points) {
         std::size_t i = 0;
         for (PointF const& p : points) {
@@ -72,7 +72,7 @@ public:
     void Key(char key, int modifiers = 0) {
         Add("key " + std::to_string(static_cast<int>(key)) + ' ' + std::to_string(modifiers));
     }
-    // Answers the prompt of a key with the end of what it proposes replaced.
+    // Presses a key and answers its prompt: replaces the end of the proposed text.
     void Ask(char key, int modifiers, std::size_t count, std::string const& end) {
         Key(key, modifiers);
         for (std::size_t i = 0; i < count; ++i) Key('\b');
@@ -87,7 +87,7 @@ private:
     std::string mText;
 };
 
-// "moka" in one line each letter, as a finger would.
+// Writes "moka" with a finger, each letter in one or two strokes.
 void WriteWord(Script& script, float x, float y) {
     auto const arc = [&](float cx, float from, float to, float rx, float ry) {
         std::vector<PointF> points;
@@ -124,13 +124,13 @@ protected:
         WriteFile(mFolder.Path("input.txt"), script.GetText());
         return "input.txt";
     }
-    // The tool of the X server, aimed at the window.
+    // Runs xdotool on the window.
     static void Do(std::string const& what) {
         std::string const command =
             "xdotool search --name moka-notebook windowfocus --sync %1 " + what + " >/dev/null 2>&1";
         EXPECT_EQ(std::system(command.c_str()), 0) << command;
     }
-    // The window when it has shown the same for a while.
+    // Returns the window's pixels when they have not changed for a while.
     Picture Grab() {
         Picture seen;
         EXPECT_TRUE(Soon([&] {
@@ -146,7 +146,7 @@ protected:
     static Picture GetPagePart(Picture const& window, int rows = kView) {
         return window.Crop(kEdge, kToolbar, kPage, rows);
     }
-    // What the tool draws from the page's file.
+    // Draws the page's file with `moka draw`.
     Picture Draw(std::string const& page) {
         std::string const out = mFolder.Path("drawn.png");
         std::string const command = std::string(MOKA_TOOL) + " draw " + mFolder.Path(page) + " -o " + out;
@@ -168,14 +168,14 @@ protected:
     ExampleWindow mWindow;
 };
 
-TEST_F(NotebookWindowTest, ShowsWhatItsFileDrawsAndOpensItAgain) {
+TEST_F(NotebookWindowTest, ShowsThePixelsOfItsFileAndOpensItAgain) {
     Script script;
     WriteWord(script, 200, 250);
     script.Key('h');
     script.Drag({190, 250}, {520, 250});
     script.Key('r');
     script.Drag({325, 150}, {325, 320});
-    script.Drag({400, 150}, {400, 320}); // is taken back
+    script.Drag({400, 150}, {400, 320}); // undone
     script.Key('z', kControl);
     script.Add("move 600 420 0");
     script.Add("drop photo.png"); // 480 x 320, selected
@@ -183,7 +183,7 @@ TEST_F(NotebookWindowTest, ShowsWhatItsFileDrawsAndOpensItAgain) {
     script.Drag({700, 500}, {650, 480});  // moved
     script.Drag({1030, 720}, {790, 560}); // scaled to half
     script.Key('p');
-    // A second finger takes back what the first one began, pans and zooms.
+    // A second finger cancels the stroke of the first one, pans and zooms.
     script.Add("finger-down 1 0.4 0.4 0.5");
     script.Add("finger 1 0.5 0.5 0.5");
     script.Add("finger-down 2 0.6 0.6 0.5");
@@ -198,11 +198,11 @@ TEST_F(NotebookWindowTest, ShowsWhatItsFileDrawsAndOpensItAgain) {
     Picture const top = Grab();
     Do("key ctrl+s");
     ASSERT_TRUE(Soon([&] { return std::filesystem::exists(mFolder.Path("page.json")); }));
-    std::this_thread::sleep_for(std::chrono::seconds(5)); // the message goes
+    std::this_thread::sleep_for(std::chrono::seconds(5)); // the message disappears
     Picture const drawn = Draw("page.json");
     ASSERT_EQ(drawn.height, 1600);
     ExpectSame(drawn.Crop(0, 0, kPage, kView), GetPagePart(Grab()), "page", kImageSlack);
-    // The stroke and the highlighter, the gap of the eraser, what undo brought back, and the image in its place.
+    // The stroke and the highlighter, the gap of the eraser, the object restored by undo, and the image at its place.
     EXPECT_NE(drawn.GetColor(240 - kEdge, 250 - kToolbar), (Color{255, 255, 255, 255}));
     EXPECT_EQ(drawn.GetColor(325 - kEdge, 250 - kToolbar), (Color{255, 255, 255, 255}));
     EXPECT_NE(drawn.GetColor(400 - kEdge, 250 - kToolbar), (Color{255, 255, 255, 255}));
@@ -240,7 +240,7 @@ TEST_F(NotebookWindowTest, AKillLosesNothingThatWasAutosaved) {
     EXPECT_EQ(mFolder.List(), (std::vector<std::string>{"input.txt", "page.json", "photo.png", "state"}));
 }
 
-TEST_F(NotebookWindowTest, ABrokenPageAndAFullDiskAreToldAndKeepTheirFile) {
+TEST_F(NotebookWindowTest, ABrokenPageAndAFullDiskAreReportedAndKeepTheirFile) {
     WriteFile(mFolder.Path("page.json"), "{\"size\": [1200, 1600], \"operations\": [");
     auto process = Start({"page.json"});
     Picture const told = Grab();
@@ -259,7 +259,7 @@ TEST_F(NotebookWindowTest, ABrokenPageAndAFullDiskAreToldAndKeepTheirFile) {
     Picture const written = Grab();
     mWindow.Close();
     EXPECT_TRUE(Soon([&] { return !(mWindow.Grab(kWidth, kHeight) == written); }))
-        << "it stays open and says so";
+        << "the window must stay open and show a message";
     mWindow.Close();
     result = process->Wait();
     EXPECT_EQ(result.status, 1);
@@ -267,8 +267,8 @@ TEST_F(NotebookWindowTest, ABrokenPageAndAFullDiskAreToldAndKeepTheirFile) {
     EXPECT_THAT(result.err, HasSubstr("full.json: File too large"));
 }
 
-// By its keys and prompts: what it exports, pastes, saves elsewhere and opens, and what it says of what cannot be.
-TEST_F(NotebookWindowTest, ExportsPastesAndOpensWhatItIsTold) {
+// Uses keys and prompts to export, paste, save under another name and open, also with inputs that fail.
+TEST_F(NotebookWindowTest, ExportsPastesAndOpensByKeysAndPrompts) {
     std::string const dot = "{\"DrawStroke\":{\"paint\":{\"color\":\"#FF000000\"},\"points\":[[300,";
     auto const write = [&](char const* page, int row, char const* more) {
         WriteFile(mFolder.Path(page),
@@ -302,10 +302,10 @@ TEST_F(NotebookWindowTest, ExportsPastesAndOpensWhatItIsTold) {
     EXPECT_EQ(LoadImage(mFolder.Path("view.png")).GetColor(300 + kEdge, 200), (Color{0, 0, 0, 255}));
     ExpectSame(Draw("page.json"), LoadImage(mFolder.Path("whole.png")), "exported");
     EXPECT_THAT(ReadFile(mFolder.Path("page-second.json")), HasSubstr("photo.png"));
-    EXPECT_THAT(ReadFile(mFolder.Path("higher.json")), HasSubstr("]}}\n]}\n")) << "saved whole";
+    EXPECT_THAT(ReadFile(mFolder.Path("higher.json")), HasSubstr("]}}\n]}\n")) << "saved completely";
 }
 
-TEST_F(NotebookWindowTest, TheRenderThreadAllocatesNothingForInkOnceItIsWarm) {
+TEST_F(NotebookWindowTest, TheRenderThreadDoesNotAllocateForInkAfterTheFirstFrames) {
     Script script;
     for (float y = 200; y < 700; y += 100) WriteWord(script, 200, y);
     script.Add("quit");
@@ -313,10 +313,10 @@ TEST_F(NotebookWindowTest, TheRenderThreadAllocatesNothingForInkOnceItIsWarm) {
         Start({"page.json", "--statistics", "--replay", WriteScript(script)})->Wait();
     std::smatch count;
     ASSERT_TRUE(std::regex_search(result.out, count, std::regex("(\\d+) in the last")));
-    EXPECT_LT(std::stoi(count[1]), 100) << "20 strokes made more than some vectors grow";
+    EXPECT_LT(std::stoi(count[1]), 100) << "more allocations than the growth of some vectors";
 }
 
-TEST_F(NotebookWindowTest, SaysWhatToDoWithoutAWindow) {
+TEST_F(NotebookWindowTest, ReportsStartFailuresWithARemedy) {
     struct Case {
         std::vector<std::string> arguments;
         std::string environment;

@@ -1,4 +1,4 @@
-// The geometry of strokes: what an eraser hits and leaves, what a lasso holds, and what a pen's positions become.
+// Tests the geometry of strokes: erasers, lassos, and the curve through a pen's positions.
 #include "apps/notebook/Ink.h"
 #include "apps/notebook/PenPath.h"
 
@@ -12,7 +12,7 @@ using namespace Moka::Notebook;
 
 InkPoints const kLine{{0, 0, 4}, {100, 0, 4}};
 
-TEST(NotebookInkTest, AnEraserTakesWhatItsDiscCoversAndLeavesBothSides) {
+TEST(NotebookInkTest, AnEraserRemovesTheCoveredPartAndKeepsBothSides) {
     std::vector<InkPoints> const pieces = Swipe{{50, -30}, {50, 30}, 10}.Cut(kLine);
     ASSERT_EQ(pieces.size(), 2u);
     EXPECT_NEAR(pieces[0].back().x, 40, 0.01);
@@ -21,7 +21,7 @@ TEST(NotebookInkTest, AnEraserTakesWhatItsDiscCoversAndLeavesBothSides) {
     EXPECT_EQ(pieces[1].back(), kLine.back());
 }
 
-TEST(NotebookInkTest, AnEraserAtAnEndShortensAndOneOverAllLeavesNothing) {
+TEST(NotebookInkTest, AnEraserAtAnEndShortensAStrokeAndOneOverAllRemovesIt) {
     std::vector<InkPoints> const rest = Swipe{{100, 0}, {100, 0}, 20}.Cut(kLine);
     ASSERT_EQ(rest.size(), 1u);
     EXPECT_NEAR(rest[0].back().x, 80, 0.01);
@@ -29,20 +29,20 @@ TEST(NotebookInkTest, AnEraserAtAnEndShortensAndOneOverAllLeavesNothing) {
     EXPECT_EQ((Swipe{{50, 40}, {60, 40}, 10}.Cut(kLine)), std::vector<InkPoints>{kLine});
 }
 
-TEST(NotebookInkTest, AStrokeIsHitAsFarAsItIsWide) {
+TEST(NotebookInkTest, AnEraserHitsAStrokeWithinItsWidth) {
     EXPECT_TRUE((Swipe{{50, 11.9f}, {50, 11.9f}, 10}.Touches(kLine)));
     EXPECT_FALSE((Swipe{{50, 12.1f}, {50, 12.1f}, 10}.Touches(kLine)));
     EXPECT_TRUE((Swipe{{5, 5}, {5, 5}, 5}.Touches({{8, 8, 1}}))) << "a dot";
 }
 
-TEST(NotebookInkTest, ALassoHoldsWhatHasHalfOfItsPointsInside) {
+TEST(NotebookInkTest, ALassoSelectsAStrokeWithHalfOfItsPointsInside) {
     std::vector<PointF> const corner{{-10, -10}, {50, -10}, {-10, 50}};
     EXPECT_TRUE(IsMostlyInside(corner, kLine));
     EXPECT_FALSE(IsMostlyInside(corner, {{0, 0, 1}, {90, 0, 1}, {90, 90, 1}}));
     EXPECT_FALSE(IsMostlyInside({}, kLine));
 }
 
-// The curve goes through the positions, each step is short, and settled points do not change any more.
+// The curve passes through the positions, its steps are short, and settled points do not change.
 TEST(NotebookInkTest, AStrokePassesThroughThePositionsOfThePen) {
     InkPoints const positions{{0, 0, 0}, {30, 0, 0}, {30, 40, 0}, {70, 40, 0}};
     PenPath path(4, true);
@@ -61,7 +61,7 @@ TEST(NotebookInkTest, AStrokePassesThroughThePositionsOfThePen) {
         EXPECT_LT(std::hypot(stroke[i].x - stroke[i - 1].x, stroke[i].y - stroke[i - 1].y), 6);
 }
 
-TEST(NotebookInkTest, PressureWidensAndThePredictionGoesOnAsThePenWent) {
+TEST(NotebookInkTest, PressureWidensAStrokeAndThePredictionContinuesAtThePensSpeed) {
     PenPath light(4, false);
     PenPath firm(4, false);
     for (std::uint32_t i = 0; i < 20; ++i) {

@@ -1,4 +1,4 @@
-// NotebookObjects.h: objects for a test's page.
+// NotebookObjects.h: creates and compares objects of a page.
 #pragma once
 
 #include "apps/notebook/Page.h"
@@ -14,10 +14,10 @@ inline ObjectPtr MakeStroke(InkPoints points, unsigned argb = 0xFF102030) {
     return std::make_shared<Object const>(Stroke{std::move(points), argb});
 }
 
-// From (x, y) 100 pixels to the right, 4 wide.
+// A stroke from (x, y) to (x + 100, y), 4 pixels wide.
 inline ObjectPtr MakeDash(float x, float y) { return MakeStroke({{x, y, 4}, {x + 100, y, 4}}); }
 
-// By what they are, not by their addresses.
+// Compares contents, not addresses.
 inline bool AreSame(Objects const& a, Objects const& b) {
     auto const isSame = [](ObjectPtr const& p, ObjectPtr const& q) {
         auto const* const s = std::get_if<Stroke>(&p->content);

@@ -1,4 +1,4 @@
-// Pages as scenes: what is written is read back, and what is wrong is told with its line.
+// Tests that pages are written and read back, and that problems are reported with their line.
 #include "apps/notebook/PageFile.h"
 #include "tests/unit/notebook/NotebookObjects.h"
 
@@ -21,7 +21,7 @@ Objects MakeObjects() {
     return objects;
 }
 
-TEST(NotebookFileTest, WhatIsWrittenIsReadBackBitByBit) {
+TEST(NotebookFileTest, AWrittenPageIsReadBackBitByBit) {
     Objects const objects = MakeObjects();
     PageText const page = Read(WritePage(objects, 2000, kFolder));
     EXPECT_TRUE(page.problems.empty()) << page.problems.front();
@@ -29,7 +29,7 @@ TEST(NotebookFileTest, WhatIsWrittenIsReadBackBitByBit) {
     EXPECT_TRUE(Read(WritePage({}, 1600, kFolder)).problems.empty());
 }
 
-// A person, or another program, may have laid the file out anew.
+// A user or another program may have changed the layout of the file.
 TEST(NotebookFileTest, ReadsThePageInAnyLayout) {
     Objects const objects = MakeObjects();
     std::string text = WritePage(objects, 2000, kFolder);
@@ -40,7 +40,7 @@ TEST(NotebookFileTest, ReadsThePageInAnyLayout) {
     EXPECT_TRUE(AreSame(page.objects, objects));
 }
 
-TEST(NotebookFileTest, TellsWhatItLeavesOutAndKeepsTheRest) {
+TEST(NotebookFileTest, ReportsOmittedOperationsAndKeepsTheRest) {
     struct Case {
         char const* what;
         char const* from;
@@ -49,8 +49,8 @@ TEST(NotebookFileTest, TellsWhatItLeavesOutAndKeepsTheRest) {
         std::size_t left;
     };
     for (Case const& c :
-         {Case{"an operation of others", "\"DrawStroke\"", "\"DrawCircle\"", "p.json:3:", 3},
-          Case{"a number that is none", "99999.99", "\"x\"", "p.json:3:", 3},
+         {Case{"an unknown operation", "\"DrawStroke\"", "\"DrawCircle\"", "p.json:3:", 3},
+          Case{"a text instead of a number", "99999.99", "\"x\"", "p.json:3:", 3},
           Case{"no JSON", "-3.0,", "-3.0,,", "p.json:3:", 3}, Case{"cut off", "]}\n", "", "the file ends", 4},
           Case{"another width", "[1200,", "[1000,", "as wide as a page", 4},
           Case{"another paper", "#FFFFFF", "#FFFFF0", "on white paper", 4}}) {

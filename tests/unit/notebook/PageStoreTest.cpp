@@ -1,4 +1,4 @@
-// What is on the disk after saves, autosaves, kills and failures.
+// Tests the files of a page after saves, autosaves, kills and failures.
 #include "apps/notebook/Document.h"
 #include "tests/support/TestFiles.h"
 #include "tests/unit/notebook/NotebookObjects.h"
@@ -20,7 +20,7 @@ class NotebookStoreTest : public ::testing::Test {
 protected:
     NotebookStoreTest() { setenv("XDG_STATE_HOME", mFolder.Path("state").c_str(), 1); }
 
-    // A document as the window has it; what it tells goes into mTold.
+    // A document as in the window; its messages are appended to mTold.
     std::unique_ptr<Document> Open(std::string const& path) {
         auto document = std::make_unique<Document>(
             Document::Callbacks{[](Splice const&) {}, [] {},
@@ -29,7 +29,7 @@ protected:
         document->Open(path);
         return document;
     }
-    // As after a kill: a copy of what is on the disk now, opened without the one that wrote it.
+    // Copies the current files and opens the copy, as after a kill.
     Objects OpenCopy(std::string const& name = "copy") {
         std::filesystem::remove_all(mFolder.Path(name));
         std::filesystem::create_directories(mFolder.Path(name));
@@ -71,8 +71,8 @@ TEST_F(NotebookStoreTest, AnAutosaveAppendsTheChangesAndAKillLosesNone) {
     EXPECT_EQ(mTold, "saved " + mPath + "\n");
 }
 
-// Cut anywhere, the journal gives a state the page had, and goes on from there.
-TEST_F(NotebookStoreTest, AJournalCutOffAtAnyByteGivesAnEarlierState) {
+// The page can be edited further from each of these states.
+TEST_F(NotebookStoreTest, AJournalTruncatedAtAnyByteRestoresAnEarlierState) {
     std::vector<Objects> states{{}};
     {
         auto const document = Open(mPath);
@@ -109,7 +109,7 @@ TEST_F(NotebookStoreTest, AJournalLeftByAnInterruptedSaveIsNotAppliedTwice) {
     document->Save(nullptr);
     ASSERT_TRUE(document->Close());
     std::string const page = ReadFile(mPath);
-    // The save marks the journal with the page that it becomes, then replaces the page, then removes the journal.
+    // A save appends the fingerprint of the new page to the journal, replaces the page, and deletes the journal.
     document->GetPage().Append(MakeDash(2, 2));
     Autosave(*document);
     std::string const second = ReadFile(mJournal);
@@ -125,7 +125,7 @@ TEST_F(NotebookStoreTest, AJournalLeftByAnInterruptedSaveIsNotAppliedTwice) {
     EXPECT_EQ(ReadFile(mJournal + ".kept"), journal);
 }
 
-TEST_F(NotebookStoreTest, APageThatWasNotReadWholeIsSavedUnderANewNameOnly) {
+TEST_F(NotebookStoreTest, APageThatWasNotReadCompletelyIsSavedOnlyUnderANewName) {
     {
         auto const document = Open(mPath);
         for (int i = 0; i < 3; ++i) document->GetPage().Append(MakeDash(1, static_cast<float>(i)));
@@ -151,8 +151,8 @@ TEST_F(NotebookStoreTest, APageThatWasNotReadWholeIsSavedUnderANewNameOnly) {
     EXPECT_EQ(Document::GetLastPath(), elsewhere);
 }
 
-// What is drawn and undone for hours does not fill the disk.
-TEST_F(NotebookStoreTest, AJournalIsWrittenAnewBeforeItIsMuchLongerThanThePage) {
+// Hours of drawing and undoing must not fill the disk.
+TEST_F(NotebookStoreTest, AJournalIsReplacedBeforeItIsMuchLongerThanThePage) {
     auto const document = Open(mPath);
     document->GetPage().Append(MakeDash(1, 1));
     document->Save(nullptr);
@@ -166,7 +166,7 @@ TEST_F(NotebookStoreTest, AJournalIsWrittenAnewBeforeItIsMuchLongerThanThePage) 
     EXPECT_TRUE(AreSame(OpenCopy(), document->GetPage().GetObjects()));
 }
 
-TEST_F(NotebookStoreTest, ASecondWindowOnAPageIsRefusedUntilTheFirstLeavesIt) {
+TEST_F(NotebookStoreTest, APageOpensInASecondWindowOnlyAfterTheFirstHasClosedIt) {
     auto first = Open(mPath);
     first->GetPage().Append(MakeDash(1, 1));
     auto const second = Open(mFolder.Path("other.json"));
@@ -182,8 +182,8 @@ TEST_F(NotebookStoreTest, ASecondWindowOnAPageIsRefusedUntilTheFirstLeavesIt) {
     EXPECT_EQ(Open(mFolder.Path("other.json"))->GetPage().GetObjects().size(), 1u) << "its own was saved";
 }
 
-// A folder in the place of the file: fails for every user, root among them.
-TEST_F(NotebookStoreTest, AFailedSaveSaysSoAndLosesNothing) {
+// A folder with the name of the file makes the write fail for every user, including root.
+TEST_F(NotebookStoreTest, AFailedSaveIsReportedAndLosesNothing) {
     auto const document = Open(mPath);
     document->GetPage().Append(MakeDash(1, 1));
     std::filesystem::create_directories(mJournal + "/x");
@@ -201,13 +201,13 @@ TEST_F(NotebookStoreTest, AFailedSaveSaysSoAndLosesNothing) {
     std::filesystem::remove_all(mJournal);
     document->GetPage().Append(MakeDash(2, 2));
     Autosave(*document);
-    EXPECT_EQ(OpenCopy().size(), 2u) << "what could not be appended came with the next autosave";
+    EXPECT_EQ(OpenCopy().size(), 2u) << "the next autosave did not append the changes again";
     std::filesystem::create_directories(mPath + "/x");
     document->Save(nullptr);
     EXPECT_FALSE(document->Close());
 }
 
-// Writes strokes without a pause and tells, through the pipe, how many an autosave or a save has put on the disk.
+// Adds strokes without a pause, and writes to the pipe how many an autosave or a save has written to the disk.
 [[noreturn]] void WriteUntilKilled(Document& document, int pipe) {
     for (int count = 0;; ++count) {
         document.GetPage().Append(MakeDash(1, static_cast<float>(count)));
@@ -246,7 +246,7 @@ TEST_F(NotebookStoreTest, TwentyKillsAfter100MillisecondsLoseNothingThatWasWritt
             ASSERT_TRUE(AreSame({found[i]}, {MakeDash(1, static_cast<float>(i))})) << i;
         most = std::max(most, kept);
     }
-    EXPECT_GT(most, 0) << "no child came as far as its first autosave";
+    EXPECT_GT(most, 0) << "no child reached its first autosave";
 }
 
 } // namespace

@@ -1,4 +1,4 @@
-// Edits of a page: what they do, how they are taken back, and how much of them is kept.
+// Tests edits of a page, undo and redo, and the limit of the history.
 #include "tests/unit/notebook/NotebookObjects.h"
 
 #include <gtest/gtest.h>
@@ -14,7 +14,7 @@ TEST(NotebookPageTest, UndoAndRedoWalkThroughEveryStateInOrder) {
         page.Append(MakeDash(0, static_cast<float>(100 * i)));
         keep();
     }
-    page.Begin(); // one stroke becomes two, another one goes
+    page.Begin(); // splits one stroke into two and deletes another
     page.Replace(2, {});
     page.Replace(1, {MakeDash(0, 5), MakeDash(0, 6)});
     page.End();
@@ -31,10 +31,10 @@ TEST(NotebookPageTest, UndoAndRedoWalkThroughEveryStateInOrder) {
     EXPECT_FALSE(page.Redo());
     page.Undo();
     page.Append(MakeDash(0, 900));
-    EXPECT_FALSE(page.CanRedo()) << "a new edit ends what could be done again";
+    EXPECT_FALSE(page.CanRedo()) << "a new edit must clear the redo list";
 }
 
-TEST(NotebookPageTest, FindsByBoundsFromTheLowestUpAndIsAsLongAsItIsWritten) {
+TEST(NotebookPageTest, FindsObjectsByBoundsFromTheLowestUpAndGrowsWithItsContent) {
     Page page;
     for (float const y : {100.0f, 200.0f, 110.0f}) page.Append(MakeDash(50, y));
     EXPECT_EQ(page.Find({60, 90, 70, 120}), (std::vector<std::size_t>{0, 2}));
@@ -50,7 +50,7 @@ TEST(NotebookPageTest, FindsByBoundsFromTheLowestUpAndIsAsLongAsItIsWritten) {
     EXPECT_EQ(page.GetHeight(), Page::kMinHeight);
 }
 
-TEST(NotebookPageTest, ForgetsTheOldestEditsOverTheLimitAndNeverThePage) {
+TEST(NotebookPageTest, DropsTheOldestEditsOverTheLimitAndNeverObjectsOfThePage) {
     Page page;
     InkPoints const points(100'000, {5, 5, 2}); // 1.2 MB each
     std::size_t const bytes = points.size() * sizeof(InkPoint);
@@ -69,7 +69,7 @@ TEST(NotebookPageTest, RefusesASpliceThatDoesNotFit) {
     Page page;
     page.Append(MakeDash(0, 0));
     EXPECT_FALSE(page.Apply({2, {}, {MakeDash(0, 1)}}));
-    EXPECT_FALSE(page.Apply({0, {MakeDash(0, 0)}, {}})) << "another object than the one that is there";
+    EXPECT_FALSE(page.Apply({0, {MakeDash(0, 0)}, {}})) << "another object than the one at this index";
     EXPECT_EQ(page.GetObjects().size(), 1u);
 }
 
