@@ -19,9 +19,9 @@ TempFolder::TempFolder() {
 
 TempFolder::~TempFolder() { std::filesystem::remove_all(mPath); }
 
-std::vector<std::string> TempFolder::List() const {
+std::vector<std::string> TempFolder::List(std::string const& folder) const {
     std::vector<std::string> names;
-    for (auto const& entry : std::filesystem::directory_iterator(mPath))
+    for (auto const& entry : std::filesystem::directory_iterator(mPath / folder))
         names.push_back(entry.path().filename().string());
     std::sort(names.begin(), names.end());
     return names;

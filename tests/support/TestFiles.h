@@ -19,7 +19,8 @@ public:
 
     std::filesystem::path const& GetPath() const { return mPath; }
     std::string Path(std::string const& name) const { return (mPath / name).string(); }
-    std::vector<std::string> List() const; // sorted
+    // Sorted; everything, hidden files as well.
+    std::vector<std::string> List(std::string const& folder = ".") const;
 
 private:
     std::filesystem::path mPath;
