@@ -5,10 +5,12 @@
 #include "moka/base/String.h"
 
 #include <algorithm>
+#include <chrono>
 #include <cstdlib>
 #include <fstream>
 #include <iterator>
 #include <memory>
+#include <thread>
 
 namespace Moka::Testing {
 
@@ -25,6 +27,13 @@ std::vector<std::string> TempFolder::List(std::string const& folder) const {
         names.push_back(entry.path().filename().string());
     std::sort(names.begin(), names.end());
     return names;
+}
+
+bool Soon(std::function<bool()> const& holds) {
+    bool isSo = holds();
+    for (int i = 0; i < 30000 && !isSo; ++i, isSo = holds())
+        std::this_thread::sleep_for(std::chrono::milliseconds(1));
+    return isSo;
 }
 
 std::string ReadFile(std::string const& path) {

@@ -4,6 +4,7 @@
 #include "tests/support/TestImages.h"
 
 #include <filesystem>
+#include <functional>
 #include <string>
 #include <vector>
 
@@ -25,6 +26,9 @@ public:
 private:
     std::filesystem::path mPath;
 };
+
+// Whether the condition holds within half a minute: the sanitizers and a cold disk take their time.
+bool Soon(std::function<bool()> const& holds);
 
 std::string ReadFile(std::string const& path);
 void WriteFile(std::string const& path, std::string const& content);
