@@ -8,13 +8,15 @@
 namespace Moka::detail {
 
 /// A word of memory that may hold anything, at any address.
-using AnyWord = std::uint64_t __attribute__((may_alias, aligned(1)));
+struct __attribute__((packed, may_alias)) AnyWord {
+    std::uint64_t bits;
+};
 
 /// One expression, not a loop: compilers would make a loop load two words at once. Those were often stored one by
 /// one a moment ago, and such a load waits until they have left the processor.
 template <std::size_t... kIndices>
 bool HasSameWords(AnyWord const* a, AnyWord const* b, std::index_sequence<kIndices...>) {
-    return ((a[kIndices] ^ b[kIndices]) | ...) == 0;
+    return ((a[kIndices].bits ^ b[kIndices].bits) | ...) == 0;
 }
 
 /// Whether the first kBytes, a multiple of 8, of a and b are equal bit by bit.
