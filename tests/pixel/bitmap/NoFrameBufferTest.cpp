@@ -86,7 +86,7 @@ TEST_F(NoFrameBuffer, OfABitmapThatIsTooWideNothingIsDrawnAndOneErrorTellsOfIt) 
     log.Clear();
 }
 
-TEST_F(NoFrameBuffer, OfABitmapWhoseTaskWasRefusedNothingIsDrawn) {
+TEST_F(NoFrameBuffer, OfABitmapThatIsRefusedOrYetToBeCreatedNothingIsDrawn) {
     for (bool const texture : {true, false}) {
         if (texture) queue->Refuse(1);
         BitmapPtr const bitmap = Create(kSide, kSide);
@@ -95,9 +95,6 @@ TEST_F(NoFrameBuffer, OfABitmapWhoseTaskWasRefusedNothingIsDrawn) {
         ExpectWindowUntouched(texture ? "no texture" : "no frame buffer");
         bitmap->GetTextureBitmap()->GetSubBitmap(0)->Unref(); // the reference of the refused task
     }
-}
-
-TEST_F(NoFrameBuffer, OfABitmapThatIsYetToBeCreatedNothingIsDrawn) {
     thread->Call([this] { DrawScenes(NewCanvas(*queue, Create(kSide, kSide), UseFrom::RenderThread)); });
     ExpectWindowUntouched("too early");
 }

@@ -132,8 +132,8 @@ Picture CanvasDrawing::Draw(Drawing const& drawing, Way way) {
     return picture;
 }
 
-ReferencePicture CanvasDrawing::DrawReference(Drawing const& drawing, int maxSide) const {
-    ReferenceCanvas::Device device{maxSide};
+void CanvasDrawing::ExpectLikeReference(Drawing const& drawing, std::string const& what, Way way) {
+    ReferenceCanvas::Device device{mSide};
     // The least that OpenGL ES allows.
     if (GetRenderThread().GetContextInfo().renderer.find("SwiftShader") != std::string::npos)
         device.subpixelBits = 4;
@@ -141,19 +141,11 @@ ReferencePicture CanvasDrawing::DrawReference(Drawing const& drawing, int maxSid
     auto const canvas = RefPtr<ReferenceCanvas>::Adopt(new ReferenceCanvas(*bitmap, device));
     ReferenceStage stage;
     drawing.draw(*canvas, stage);
-    return {bitmap->image, canvas->GetSlack()};
-}
-
-void CanvasDrawing::ExpectLikeReference(Drawing const& drawing, std::string const& what, Way way) {
-    ExpectLike(DrawReference(drawing, mSide), Draw(drawing, way), what);
-}
-
-void CanvasDrawing::ExpectLike(ReferencePicture const& reference, Picture const& actual,
-                               std::string const& what) {
-    int const open = reference.slack.CountOver(kCoarse);
-    EXPECT_LE(open * 7, actual.width * actual.height) << what << ": the reference knows too little";
+    int const open = canvas->GetSlack().CountOver(kCoarse);
+    EXPECT_LE(open * 7, drawing.start.width * drawing.start.height)
+        << what << ": the reference knows too little";
     RecordProperty("open", open);
-    ExpectSame(reference.image, actual, what, &reference.slack);
+    ExpectSame(bitmap->image, Draw(drawing, way), what, &canvas->GetSlack());
 }
 
 void CanvasDrawing::ExpectSame(Picture const& expected, Picture const& actual, std::string const& what,

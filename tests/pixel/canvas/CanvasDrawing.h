@@ -30,12 +30,6 @@ enum class Way {
     RenderThread // a render-thread canvas, drawn on there
 };
 
-// What the reference drew, and how far off each pixel may be.
-struct ReferencePicture {
-    Picture image;
-    Slack slack;
-};
-
 // Every alpha, with colours of its own, so that every blend shows.
 Picture MakeBackdrop(int width, int height);
 
@@ -60,11 +54,8 @@ protected:
 
     Picture Draw(Drawing const& drawing, Way way = Way::Deferred);
 
-    ReferencePicture DrawReference(Drawing const& drawing, int maxSide) const;
-
     // As near as the reference allows, which may leave more than kCoarse open in a seventh of the picture.
     void ExpectLikeReference(Drawing const& drawing, std::string const& what, Way way = Way::Deferred);
-    void ExpectLike(ReferencePicture const& reference, Picture const& actual, std::string const& what);
     static void ExpectSame(Picture const& expected, Picture const& actual, std::string const& what,
                            Slack const* slack = nullptr);
 

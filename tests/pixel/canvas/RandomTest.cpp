@@ -4,6 +4,7 @@
 #include "moka/renderer/RendererFactory.h"
 #include "tests/pixel/canvas/CanvasDrawing.h"
 
+#include <limits>
 #include <random>
 
 namespace Moka::Testing {
@@ -12,9 +13,15 @@ namespace {
 constexpr int kWidth = 160;
 constexpr int kHeight = 120;
 
+constexpr float kHuge = std::numeric_limits<float>::max();
+constexpr float kInfinity = std::numeric_limits<float>::infinity();
+constexpr float kStrange[] = {
+    std::numeric_limits<float>::quiet_NaN(), kInfinity, -kInfinity, kHuge, -kHuge, 0};
+
 class RandomScene {
 public:
-    RandomScene(unsigned seed, int top) : mRandom(seed), mTop(top) {}
+    RandomScene(unsigned seed, int top, bool isStrange = false)
+        : mRandom(seed), mTop(top), mIsStrange(isStrange) {}
 
     void DrawPile(IMKCanvas& canvas, Scenes::SceneStage& stage) {
         RefPtr<IMKBitmap> const bitmaps[] = {MakeBitmap(stage, MakeAlphaPattern(12, 9)),
@@ -58,6 +65,7 @@ public:
 private:
     int Below(int end) { return std::uniform_int_distribution<int>(0, end - 1)(mRandom); }
     float Between(float low, float high) {
+        if (mIsStrange && Below(5) == 0) return kStrange[Below(6)];
         float const value = std::uniform_real_distribution<float>(low, high)(mRandom);
         // Through pixel centres and corners as often as not.
         return Below(2) == 0 ? value : std::floor(value * 4) / 4;
@@ -121,6 +129,7 @@ private:
 
     std::mt19937 mRandom;
     int const mTop; // of the cells
+    bool const mIsStrange;
     MKPaint mPaint;
     int mLevel = -1; // below the clip
     MKPaint::XFermode mMode = MKPaint::SrcOver;
@@ -162,7 +171,80 @@ TEST_P(RandomTest, JoinedDrawsAreTheSameAsOneByOne) {
     ExpectSame(single, merged, "merged", &slack);
 }
 
+// Nothing crashes, no GL error, and what is drawn next is right.
+TEST_P(RandomTest, NumbersAndMatricesThatMakeNoSenseDisturbNothing) {
+    kept = 1;
+    auto const draw = [](bool isDisturbed) -> Drawing::Function {
+        return [isDisturbed](IMKCanvas& canvas, Scenes::SceneStage& stage) {
+            canvas.Save(IMKCanvasBase::SaveAll);
+            if (isDisturbed) RandomScene(GetParam(), 0, true).DrawPile(canvas, stage);
+            canvas.Restore(0);
+            canvas.ClearAll(0x60203040);
+            RandomScene(GetParam(), 0).DrawCells(canvas, stage);
+        };
+    };
+    Picture const start = MakeBackdrop(kWidth, kHeight);
+    Picture const expected = Draw({start, draw(false)});
+    Slack const slack(kWidth, kHeight, 1);
+    for (Way const way : {Way::Deferred, Way::RenderThread})
+        ExpectSame(expected, Draw({start, draw(true)}, way), "after strange numbers", &slack);
+}
+
 INSTANTIATE_TEST_SUITE_P(Seeds, RandomTest, ::testing::Range(1u, 13u));
+
+using CanvasTest = CanvasDrawing;
+
+// Through a window of 90 x 80 units at (left, top): a mediump float of 16 bits overflows when a distance above 256 is
+// squared, and tells places above 1024 apart to a whole unit only.
+TEST_F(CanvasTest, EdgesAreAsFineFarFromTheOriginAndFarFromTheirCentre) {
+    MKPaint paint;
+    paint.SetColor(0.9f, 0.5f, 0.2f, 0.8f);
+    paint.SetStyle(MKPaint::Stroke);
+    paint.SetLineWidth(6);
+    paint.SetLineCapType(MKPaint::Round);
+    paint.SetAntiAliasing(true);
+    MKPaint filled = paint, wide = paint, dashed = paint;
+    filled.SetStyle(MKPaint::Fill);
+    wide.SetLineWidth(560);
+    dashed.SetDashedLinePattern(Vector2<float>(9.25f, 8));
+    struct {
+        char const* what;
+        float left, top;
+        std::function<void(IMKCanvas&)> draw;
+    } const cases[] = {
+        {"large circle", 1060, 980, [&](auto& c) { c.DrawCircle(700.25f, 1000.5f, 400, &filled); }},
+        {"large ring", 1060, 980, [&](auto& c) { c.DrawCircle(700.25f, 1000.5f, 400, &paint); }},
+        {"circle far away", 3000, 2000, [&](auto& c) { c.DrawCircle(3040.3f, 2040.7f, 30.25f, &filled); }},
+        {"ring far away", 3000, 2000, [&](auto& c) { c.DrawCircle(3040.3f, 2040.7f, 30.25f, &paint); }},
+        {"wide cap", 1745, 190, [&](auto& c) { c.DrawLine(400, 220, 1750, 500, &wide); }},
+        {"dashes far from the start", 2920, 290, [&](auto& c) { c.DrawLine(4, 100.5f, 2990, 340, &dashed); }},
+    };
+    for (auto const& one : cases) {
+        ExpectLikeReference({MakeBackdrop(90, 80),
+                             [&](IMKCanvas& canvas, Scenes::SceneStage&) {
+                                 canvas.PreTranslate(-one.left, -one.top);
+                                 one.draw(canvas);
+                             }},
+                            one.what);
+    }
+}
+
+TEST_F(CanvasTest, ABitmapIsDrawnOntoItselfAndOntoItsClone) {
+    kept = 2; // a texture and its frame buffer
+    for (bool const clone : {false, true}) {
+        ExpectLikeReference({MakeBackdrop(40, 40),
+                             [&](IMKCanvas& canvas, Scenes::SceneStage&) {
+                                 IMKBitmap* const target = canvas.GetBitmap();
+                                 auto const source = clone ? RefPtr<IMKBitmap>::Adopt(target->Clone())
+                                                           : RefPtr<IMKBitmap>::Share(target);
+                                 MKPaint paint;
+                                 paint.SetXFermode(MKPaint::Src);
+                                 canvas.DrawBitmap(source.Get(), RectF(0, 0, 20, 30), RectF(7, 5, 27, 35),
+                                                   &paint);
+                             }},
+                            clone ? "onto its clone" : "onto itself");
+    }
+}
 
 } // namespace
 } // namespace Moka::Testing

@@ -1,9 +1,9 @@
 // Strokes against the maximum over their segments of the clamped distance, computed in double precision for each
-// pixel: turns, crossings, widths and zooms; and in strips, under clips, merged, appended to piece by piece.
+// pixel: turns, crossings, widths and zooms; and in strips, under clips, appended to piece by piece.
 #include "moka/base/log/AndroidLog.h"
 #include "moka/graphics/drawable/MKStrokeDrawable.h"
-#include "moka/renderer/RendererFactory.h"
 #include "tests/pixel/canvas/CanvasDrawing.h"
+#include "tests/support/reference/Plane.h"
 
 #include <cmath>
 #include <random>
@@ -21,45 +21,19 @@ constexpr int kHeight = 100;
 constexpr int kClose = 14;
 constexpr int kFar = 24;
 
-struct Place {
-    double x;
-    double y;
-};
-
-// The canvas's pixels at the target's.
-class Inverse {
-public:
-    explicit Inverse(Matrix3f const& matrix) {
-        auto const at = [&](int row, int column) { return double{matrix(row % 3, column % 3)}; };
-        for (int i = 0; i < 3; ++i) {
-            for (int j = 0; j < 3; ++j) {
-                mValues[i][j] = at(j + 1, i + 1) * at(j + 2, i + 2) - at(j + 1, i + 2) * at(j + 2, i + 1);
-            }
-        }
-    }
-
-    Place Find(double x, double y) const {
-        auto const at = [&](int row) { return mValues[row][0] * x + mValues[row][1] * y + mValues[row][2]; };
-        return {at(0) / at(2), at(1) / at(2)};
-    }
-
-private:
-    double mValues[3][3]; // times the determinant
-};
-
 // A pixel's centre on the canvas, and how long the pixel is there along the target's axes.
 struct Pixel {
-    Pixel(Inverse const& inverse, double x, double y) : center(inverse.Find(x, y)) {
+    Pixel(Transform const& transform, double x, double y) : center(*transform.Unmap({x, y})) {
         constexpr double kStep = 1e-4;
-        Place const beside = inverse.Find(x + kStep, y);
-        Place const below = inverse.Find(x, y + kStep);
+        PointD const beside = *transform.Unmap({x + kStep, y});
+        PointD const below = *transform.Unmap({x, y + kStep});
         right = {(beside.x - center.x) / kStep, (beside.y - center.y) / kStep};
         down = {(below.x - center.x) / kStep, (below.y - center.y) / kStep};
     }
 
-    Place center;
-    Place right;
-    Place down;
+    PointD center;
+    PointD right;
+    PointD down;
 };
 
 double Cover(MKStrokePoint const& a, MKStrokePoint const& b, Pixel const& pixel) {
@@ -91,10 +65,10 @@ double Cover(MKStrokePoint const& a, MKStrokePoint const& b, Pixel const& pixel)
 
 Picture DrawReferenceStroke(Points const& points, Matrix3f const& matrix) {
     Picture picture(kWidth, kHeight);
-    Inverse const inverse(matrix);
+    Transform const transform(matrix);
     for (int y = 0; y < kHeight; ++y) {
         for (int x = 0; x < kWidth; ++x) {
-            Pixel const pixel(inverse, x + 0.5, y + 0.5);
+            Pixel const pixel(transform, x + 0.5, y + 0.5);
             double most = 0;
             for (std::size_t i = 0; i < points.size() && most < 1; ++i) {
                 most = std::max(most, Cover(points[i], points[std::min(i + 1, points.size() - 1)], pixel));
@@ -119,61 +93,45 @@ Drawing OneStroke(Points const& points, Matrix3f const& matrix, MKPaint const& p
             }};
 }
 
-Points Wave(float width) {
-    Points points;
-    for (int i = 0; i <= 80; ++i) {
-        float const t = static_cast<float>(i) / 80;
-        points.push_back({8 + 104 * t, 50 + 35 * std::sin(t * 9), width * (0.6f + 0.4f * std::cos(t * 7))});
-    }
-    return points;
-}
-
-// Crosses itself again and again, with points close to each other.
-Points Loops(float width) {
-    Points points;
-    for (int i = 0; i <= 200; ++i) {
-        float const t = static_cast<float>(i) / 200;
-        float const turn = t * 31;
-        points.push_back({28 + 64 * t + 20 * std::cos(turn), 50 + 28 * std::sin(turn), width});
-    }
-    return points;
-}
-
-Points Scribble(float width) {
-    std::mt19937 random(7);
-    std::uniform_real_distribution<float> x(8, 112);
-    std::uniform_real_distribution<float> y(8, 92);
-    Points points;
-    for (int i = 0; i < 30; ++i) points.push_back({x(random), y(random), width});
-    return points;
-}
-
+// Points of width 1 at most.
 struct Shape {
     char const* name;
-    Points (*make)(float width);
+    Points points;
+
+    Points Widened(float width) const {
+        Points widened = points;
+        for (MKStrokePoint& point : widened) point.width *= width;
+        return widened;
+    }
 };
 
-constexpr Shape kShapes[] = {
-    {"straight",
-     [](float width) -> Points {
-         return {{14.3f, 20.7f, width}, {100.2f, 76.1f, width}};
-     }},
-    {"sharp",
-     [](float width) -> Points {
-         return {{12, 45, width}, {105, 38, width}, {15, 50, width}, {100, 88, width}, {99, 12, width}};
-     }},
-    {"taper",
-     [](float width) -> Points {
-         return {{20, 20, 0}, {60, 78, width}, {108, 26, width / 4}};
-     }},
-    {"dot",
-     [](float width) -> Points {
-         return {{60.5f, 46.25f, width}, {60.5f, 46.25f, width}};
-     }},
-    {"wave", Wave},
-    {"loops", Loops},
-    {"scribble", Scribble},
-};
+// Crosses itself again and again, with points close to each other.
+Shape MakeLoops() {
+    Shape loops{"loops", {}};
+    for (int i = 0; i <= 200; ++i) {
+        float const t = static_cast<float>(i) / 200;
+        loops.points.push_back({28 + 64 * t + 20 * std::cos(t * 31), 50 + 28 * std::sin(t * 31), 1});
+    }
+    return loops;
+}
+
+std::vector<Shape> MakeShapes() {
+    Shape wave{"wave", {}}, scribble{"scribble", {}};
+    for (int i = 0; i <= 80; ++i) {
+        float const t = static_cast<float>(i) / 80;
+        wave.points.push_back({8 + 104 * t, 50 + 35 * std::sin(t * 9), 0.6f + 0.4f * std::cos(t * 7)});
+    }
+    std::mt19937 random(7);
+    std::uniform_real_distribution<float> x(8, 112), y(8, 92);
+    for (int i = 0; i < 30; ++i) scribble.points.push_back({x(random), y(random), 1});
+    return {{"straight", {{14.3f, 20.7f, 1}, {100.2f, 76.1f, 1}}},
+            {"sharp", {{12, 45, 1}, {105, 38, 1}, {15, 50, 1}, {100, 88, 1}, {99, 12, 1}}},
+            {"taper", {{20, 20, 0}, {60, 78, 1}, {108, 26, 0.25f}}},
+            {"dot", {{60.5f, 46.25f, 1}, {60.5f, 46.25f, 1}}},
+            MakeLoops(),
+            wave,
+            scribble};
+}
 
 class StrokeTest : public CanvasDrawing {
 protected:
@@ -198,9 +156,9 @@ protected:
 };
 
 TEST_F(StrokeTest, CoverageIsTheMaximumOfTheSegments) {
-    for (Shape const& shape : kShapes) {
+    for (Shape const& shape : MakeShapes()) {
         for (float const width : {0.2f, 1.0f, 3.0f, 12.0f, 60.0f, 200.0f}) {
-            ExpectStroke(shape.make(width), Matrix3f(),
+            ExpectStroke(shape.Widened(width), Matrix3f(),
                          shape.name + std::string(" ") + std::to_string(width));
         }
     }
@@ -220,93 +178,48 @@ TEST_F(StrokeTest, EdgesAreOneDevicePixelUnderAnyMatrix) {
     };
     int number = 0;
     for (Matrix3f const& matrix : matrices) {
-        for (Shape const& shape : kShapes) {
+        for (Shape const& shape : MakeShapes()) {
             // Each shape and each matrix with each width.
             constexpr float kWidths[] = {0.5f, 4, 40};
             float const width = kWidths[number++ % 3];
-            ExpectStroke(shape.make(width), matrix,
+            ExpectStroke(shape.Widened(width), matrix,
                          shape.name + std::string(" under matrix ") + std::to_string(&matrix - matrices));
         }
     }
 }
 
-// Every ink and way of drawing over a backdrop: strokes that touch, in other colours, alphas, modes and widths.
-void DrawMany(IMKCanvas& canvas, Scenes::SceneStage& stage) {
-    MKPaint paint;
-    for (int i = 0; i < 40; ++i) {
-        auto const at = static_cast<float>(i);
-        Points points = Wave(1 + std::fmod(at * 1.7f, 9.0f));
-        for (MKStrokePoint& point : points) point.y += 40 * std::sin(at);
-        paint.SetColor(std::fmod(at * 0.3f, 1.0f), std::fmod(at * 0.7f, 1.0f), 0.5f, i % 3 == 0 ? 1 : 0.4f);
-        paint.SetXFermode(i / 10 == 2 ? MKPaint::SrcAtop : MKPaint::SrcOver);
-        if (i == 35) paint.SetTintColor(0.1f, 0.9f, 0.3f, 0.5f);
-        canvas.Draw(MakeStroke(stage, points).Get(), &paint);
-    }
-}
-
-TEST_F(StrokeTest, StrokesOfManyColorsMergeIntoAFewCalls) {
-    Drawing const drawing = Twice({MakeBackdrop(kWidth, kHeight), DrawMany});
-    Picture const single = Draw(drawing, Way::Immediate);
-    RendererStatistics const before = RendererFactory::GetStatistics();
-    Picture const merged = Draw(drawing);
-    RendererStatistics const after = RendererFactory::GetStatistics();
-    // Three runs of colours at a time, the first ones of which are drawn one by one.
-    EXPECT_GE(after.drawRequests - before.drawRequests, 80u);
-    EXPECT_LE(after.draws - before.draws, 40u);
-    Slack const slack(kWidth, kHeight, 1);
-    ExpectSame(single, merged, "strokes merged", &slack);
-}
-
-TEST_F(StrokeTest, StripsAndScissorsCutWithoutATrace) {
-    auto const whole = [](IMKCanvas& canvas, Scenes::SceneStage& stage) {
-        MKPaint paint;
-        paint.SetColor(0.2f, 0.4f, 0.9f, 0.5f);
-        canvas.PreRotate(10, 60, 50);
-        canvas.Draw(MakeStroke(stage, Loops(9)).Get(), &paint);
+TEST_F(StrokeTest, StripsCutWithoutATraceAndStencilsNotAtAll) {
+    auto const draw = [](bool isStenciled) {
+        return [isStenciled](IMKCanvas& canvas, Scenes::SceneStage& stage) {
+            MKPaint paint;
+            paint.SetColor(0.2f, 0.4f, 0.9f, 0.5f);
+            if (isStenciled) {
+                canvas.PreRotate(20, 60, 50);
+                canvas.SetClipRect(20, 15, 70, 60, IMKCanvasBase::Intersect);
+                canvas.SetMatrix(Matrix3f());
+            }
+            canvas.PreScale(0.37f, 1.1f);
+            canvas.Draw(MakeStroke(stage, MakeLoops().Widened(12)).Get(), &paint);
+        };
     };
-    auto const scissored = [=](IMKCanvas& canvas, Scenes::SceneStage& stage) {
-        canvas.SetClipRect(20, 15, 70, 60, IMKCanvasBase::Intersect);
-        whole(canvas, stage);
-    };
-    auto const stenciled = [=](IMKCanvas& canvas, Scenes::SceneStage& stage) {
-        canvas.PreRotate(20, 60, 50);
-        canvas.SetClipRect(20, 15, 70, 60, IMKCanvasBase::Intersect);
-        canvas.SetMatrix(Matrix3f());
-        whole(canvas, stage);
-    };
-    Picture const start = MakeBackdrop(kWidth, kHeight);
-    Picture const plain = Draw({start, whole});
-    Picture const cut = Draw({start, scissored});
-    for (int y = 0; y < kHeight; ++y) {
-        for (int x = 0; x < kWidth; ++x) {
-            bool const inside = x >= 20 && x < 90 && y >= 15 && y < 75;
-            ASSERT_EQ(cut.GetColor(x, y), (inside ? plain : start).GetColor(x, y)) << x << ", " << y;
-        }
-    }
-    // Custom drawables are not cut by clips that need the stencil; they come out whole.
-    ExpectSame(plain, Draw({start, stenciled}), "stroke under a rotated clip");
-    // Three strips.
-    Drawing const tall{MakeBackdrop(40, 110), [](IMKCanvas& canvas, Scenes::SceneStage& stage) {
-                           MKPaint paint;
-                           paint.SetColor(0.2f, 0.4f, 0.9f, 0.5f);
-                           canvas.PreScale(0.37f, 1.1f);
-                           canvas.Draw(MakeStroke(stage, Loops(12)).Get(), &paint);
-                       }};
-    Picture const one = Draw(tall);
-    UseLargestSide(40);
+    Picture const start = MakeBackdrop(40, 110);
+    Picture const plain = Draw({start, draw(false)});
+    ExpectSame(plain, Draw({start, draw(true)}), "stroke under a rotated clip");
+    UseLargestSide(40); // three strips
     Slack const slack(40, 110, 1);
-    ExpectSame(one, Draw(tall), "stroke in strips", &slack);
+    ExpectSame(plain, Draw({start, draw(false)}), "stroke in strips", &slack);
 }
 
 TEST_F(StrokeTest, AppendingPieceByPieceDrawsTheSameStroke) {
-    for (Shape const& shape : kShapes) {
-        Points const points = shape.make(14);
-        Picture const whole = Draw(OneStroke(points, Matrix3f()));
+    MKPaint half; // so that what is drawn twice shows
+    half.SetAlpha(0.5f);
+    for (Shape const& shape : MakeShapes()) {
+        Points const points = shape.Widened(14);
+        Picture const whole = Draw(OneStroke(points, Matrix3f(), half));
         Picture const pieces =
             Draw({Picture(kWidth, kHeight), [&](IMKCanvas& canvas, Scenes::SceneStage& stage) {
                       auto const stroke = MakeStroke(stage, {{1, 1, 30}});
-                      MKPaint const paint;
-                      canvas.Draw(stroke.Get(), &paint);
+                      canvas.Draw(stroke.Get(), &half);
                       stroke->Clear();
                       int left = static_cast<int>(points.size());
                       for (MKStrokePoint const& point : points) {
@@ -315,10 +228,10 @@ TEST_F(StrokeTest, AppendingPieceByPieceDrawsTheSameStroke) {
                           // At two scales in turn, so that both meshes grow.
                           canvas.ClearAll(0);
                           canvas.PreScale(0.3f, 0.3f);
-                          canvas.Draw(stroke.Get(), &paint);
+                          canvas.Draw(stroke.Get(), &half);
                           canvas.SetMatrix(Matrix3f());
                           canvas.ClearAll(0);
-                          canvas.Draw(stroke.Get(), &paint);
+                          canvas.Draw(stroke.Get(), &half);
                       }
                   }});
         Slack const slack(kWidth, kHeight, 1);

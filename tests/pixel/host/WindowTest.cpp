@@ -177,10 +177,10 @@ TEST_F(WindowTest, AWindowThatGrowsAndShrinksWhileFramesAreDrawnShowsTheNextFram
         window->Resize(size.width, size.height); // frames of the old size are still coming
         std::this_thread::sleep_for(milliseconds(20));
         drawn = size;
-        EXPECT_TRUE(ShowsSoon(1, 1, size.width > kWidth ? kRed : kBlue)) << size.width;
-        EXPECT_TRUE(ShowsSoon(size.width - 2, 1, size.width > kWidth ? kRed : kBlue)) << size.width;
-        EXPECT_TRUE(ShowsSoon(1, size.height - 2, kGreen)) << size.width;
-        EXPECT_TRUE(ShowsSoon(size.width - 2, size.height - 2, kGreen)) << size.width;
+        for (int const x : {1, size.width - 2}) {
+            EXPECT_TRUE(ShowsSoon(x, 1, size.width > kWidth ? kRed : kBlue)) << size.width;
+            EXPECT_TRUE(ShowsSoon(x, size.height - 2, kGreen)) << size.width;
+        }
     }
     isOver = true;
     drawer.join();
@@ -217,11 +217,14 @@ TEST_F(WindowTest, AWindowThatIsDestroyedWhileFramesWaitIsOneLineAndTheThreadGoe
 TEST_F(WindowTest, WhatIsNotThereIsToldAndEndsNothing) {
     thread.reset();
     RenderThreadOptions missing = options;
-    missing.nativeWindow = options.nativeWindow + 1000;
     for (void* const display : {options.nativeDisplay, static_cast<void*>(nullptr)}) {
         missing.nativeDisplay = display;
-        EXPECT_FALSE(RenderThread::Start(missing, &error));
-        EXPECT_THAT(error, HasSubstr("no window 0x"));
+        for (std::uintptr_t const number :
+             {UINTPTR_MAX, std::uintptr_t{1} << 29, options.nativeWindow + 1000}) {
+            missing.nativeWindow = number;
+            EXPECT_FALSE(RenderThread::Start(missing, &error));
+            EXPECT_THAT(error, HasSubstr("no window 0x"));
+        }
     }
     std::string const name = std::getenv("DISPLAY");
     setenv("DISPLAY", ":7654", 1);
@@ -229,14 +232,12 @@ TEST_F(WindowTest, WhatIsNotThereIsToldAndEndsNothing) {
     EXPECT_THAT(error, HasSubstr("X server \":7654\""));
     setenv("DISPLAY", name.c_str(), 1);
 
-    RenderThreadOptions wrong = options;
-    wrong.framesInFlight = 0;
-    EXPECT_FALSE(RenderThread::Start(wrong, &error));
-    EXPECT_THAT(error, HasSubstr("framesInFlight is 0"));
-    wrong = options;
-    wrong.swapInterval = -1;
-    EXPECT_FALSE(RenderThread::Start(wrong, &error));
-    EXPECT_THAT(error, HasSubstr("swapInterval is -1"));
+    for (bool const isInterval : {false, true}) {
+        RenderThreadOptions wrong = options;
+        (isInterval ? wrong.swapInterval : wrong.framesInFlight) = -1;
+        EXPECT_FALSE(RenderThread::Start(wrong, &error));
+        EXPECT_THAT(error, HasSubstr(isInterval ? "swapInterval is -1" : "framesInFlight is -1"));
+    }
 
     options.nativeDisplay = nullptr; // the server that DISPLAY names
     Start();

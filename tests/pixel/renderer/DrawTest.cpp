@@ -9,32 +9,6 @@ namespace {
 
 using DrawTest = DrawFixture;
 
-TEST_P(DrawTest, AStencilClipHoldsForDrawsAndClearsUntilItIsLifted) {
-    DepthStencilPtr const buffer = MakeDepthStencil(kSize, kSize);
-    target->AttachDepthStencil(buffer.get());
-    target->Activate();
-    target->ClearDepthStencil(false, 1, true, 0);
-    SetStencil(StencilAlways, 1, StencilIncrementSaturate);
-    blend->SetDescriptor(BlendStateDescriptor(false));
-    blend->Apply();
-    Fill(kRed, 2, 2, 6, 6);
-    SetStencil(StencilEqual, 1, StencilKeep);
-    RendererFactory::SetStencilClip(true);
-    blend->SetDescriptor(BlendStateDescriptor(true));
-    blend->Apply();
-    StatePtr const plain(RendererFactory::CreateDepthStencilState(DepthStencilStateDescriptor(false, false)));
-    plain->Apply(); // as every drawable does
-    target->ClearColor(0, 1, 0, 1);
-    Fill(kRed, 0, 0, 4, 8);
-    RendererFactory::SetStencilClip(false);
-    plain->Apply();
-    Fill(kBlue, 7, 7, 8, 8);
-    target->DetachDepthStencil();
-    target->Deactivate(false, false);
-    EXPECT_EQ(Read(),
-              With(With(With(Filled(kClear), kGreen, 2, 2, 4, 4), kRed, 2, 2, 2, 4), kBlue, 7, 7, 1, 1));
-}
-
 void GL_APIENTRY KeepGroup(GLenum, GLenum type, GLuint, GLenum, GLsizei, GLchar const* text,
                            void const* user) {
     auto* const groups = static_cast<std::vector<std::string>*>(const_cast<void*>(user));
@@ -90,22 +64,6 @@ TEST_P(DrawTest, CountsAndFirstAreCutToWhatIsThere) {
     target->Deactivate(false, false);
 }
 
-TEST_P(DrawTest, WithoutAProgramThatCompiledNothingIsDrawn) {
-    target->Activate();
-    SetQuad(0, 0, 8, 8);
-    EXPECT_FALSE(quad->Draw(0, -1, 1));
-    ProgramPtr const broken(RendererFactory::CreateShaderProgram("misspelt", kColored, "broken"));
-    EXPECT_EQ(TakeErrors().size(), 1u);
-    ForgetDriverErrors();
-    broken->MakeCurrent();
-    EXPECT_FALSE(quad->Draw(0, -1, 1));
-    Fill(kRed, 0, 0, 8, 8);
-    colored.reset(); // while it is in the list
-    EXPECT_FALSE(quad->Draw(0, -1, 1));
-    EXPECT_EQ(Read(), Filled(kRed));
-    target->Deactivate(false, false);
-}
-
 TEST_P(DrawTest, AFullListIsSubmittedAndASecondFrameNeitherQueriesNorGrowsAnything) {
     constexpr int kDraws = 50000; // several times what a list holds
     auto const drawFrame = [this] {
@@ -135,6 +93,28 @@ TEST_P(DrawTest, AFullListIsSubmittedAndASecondFrameNeitherQueriesNorGrowsAnythi
     }
     EXPECT_GT(Count().flushes, after.flushes);
     target->Deactivate(false, false);
+}
+
+// The copy of the target flushes the list that the vertices fill.
+TEST_P(DrawTest, AnImageIsDrawnOntoItselfWithMoreVerticesThanAListHolds) {
+    BlendStateDescriptor add(true);
+    add.SetColorEquation(BlendingFunction::Add, BlendingFactor::One, BlendingFactor::One);
+    blend->SetDescriptor(add);
+    target->Activate();
+    blend->Apply();
+    Fill({100, 0, 0, 255}, 0, 0, 8, 8);
+    int const unit = 1;
+    texture->Bind(unit);
+    textured->program->MakeCurrent();
+    textured->parameter->Set(&unit);
+    std::vector<float> corners{0, 0, 0, 8, 8, 0, 8, 0, 0, 8, 8, 8};
+    corners.resize(300000); // the others are a point
+    quad->SetVertices(0, corners.data(), 150000);
+    EXPECT_TRUE(quad->Draw(0, -1, 1));
+    Fill(kGreen, 0, 0, 2, 2);
+    EXPECT_EQ(Read(), With(Filled({200, 0, 0, 255}), {200, 255, 0, 255}, 0, 0, 2, 2));
+    target->Deactivate(false, false);
+    RendererFactory::Flush(); // takes the copy away
 }
 
 INSTANTIATE_TEST_SUITE_P(ImmediateAndDeferred, DrawTest, ::testing::Bool(), GetDrawMode);

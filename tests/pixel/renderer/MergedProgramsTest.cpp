@@ -1,16 +1,98 @@
 // Foreign programs whose draws are merged, or are not because their text is not understood: the picture is the one
 // that the same draws give one by one.
 #include "tests/pixel/renderer/DrawFixture.h"
-#include "tests/pixel/renderer/ForeignPrograms.h"
 
 #include "moka/base/log/AndroidLog.h"
 #include "tests/support/ImageCompare.h"
 #include "tests/support/LogCapture.h"
 
-#include <limits>
-
 namespace Moka::Testing {
 namespace {
+
+// Programs with odd declarations. Places are "corner" or the first attribute, in normalized device coordinates; uniforms
+// are named color, other, pair, number, count, flag, matrix, texel and mask.
+#define MOKA_VERTEX "attribute vec2 corner; attribute vec2 uv; "
+#define MOKA_PLAIN MOKA_VERTEX "void main() { gl_Position = vec4(corner, 0.0, 1.0); }"
+
+struct Texts {
+    char const* subject;
+    char const* vertex;
+    char const* fragment;
+    bool isMerged = true; // otherwise each draw is a call
+};
+
+constexpr Texts kPlain{"plain", MOKA_PLAIN,
+                       "precision highp float; uniform vec4 color; void main() { gl_FragColor = color; }"};
+// Records of 96 bytes.
+constexpr Texts kWide{"wide",
+                      "attribute vec2 corner; uniform mat4 matrix; uniform highp float number;"
+                      "void main() { gl_Position = matrix * vec4(corner, number, 1.0); }",
+                      "precision highp float; uniform vec4 color; void main() { gl_FragColor = color; }"};
+
+constexpr Texts kPrograms[] = {
+    {"comments", MOKA_PLAIN,
+     "precision highp float;\nuniform /* ; */ highp // , }\n vec4 /**/ color /* { */ ; //uniform float "
+     "gone;\n"
+     "void main(/* none */ void) { gl_FragColor = color; }"},
+    {"macros", MOKA_PLAIN,
+     "#define HALF 0.5\n#define SCALE(x) ((x) * HALF)\n#ifdef HALF\n#define ALPHA 1.0\n#else\n#define ALPHA "
+     "0.0\n"
+     "#endif\nprecision highp float; uniform vec4 color; uniform float number;\n"
+     "void main() { gl_FragColor = vec4(SCALE(color.rgb) + number * HALF, ALPHA); }"},
+    {"shared names",
+     MOKA_VERTEX "uniform highp vec4 color; uniform highp float number; varying highp vec2 at;"
+                 "void main() { at = uv * number; gl_Position = vec4(corner, color.x * 0.1, 1.0); }",
+     "precision highp float; uniform vec4 color; uniform float number; varying vec2 at;"
+     "void main() { gl_FragColor = vec4(at, number, color.y); }"},
+    {"precision statements, names in a row, and one hidden by a local variable", MOKA_PLAIN,
+     "precision lowp float; precision mediump int; precision highp float;"
+     "uniform lowp vec4 color,other /* two */, unused; uniform mediump float number;"
+     "float hide() { float number = 0.25; { vec2 color = vec2(number); number = color.x; } return number; }"
+     "void main() { gl_FragColor = color * hide() + other * number * 0.5; }"},
+    {"hidden by a parameter", MOKA_PLAIN,
+     "precision highp float; uniform vec4 color, other;"
+     "vec4 turn(vec4 other, inout vec4 color) { color = color * 0.5; return other.bgra; }"
+     "void main() { vec4 c = color; vec4 d = turn(color, c); gl_FragColor = c + d * 0.5 + other * 0.1; }"},
+    {"integers",
+     MOKA_VERTEX "uniform highp int count; uniform bool flag; void main() {"
+                 "gl_Position = vec4(flag ? corner : corner * 0.9, float(count) * 0.1, 1.0); }",
+     "precision highp float; uniform bool flag; uniform highp int count; uniform vec4 color;"
+     "void main() { vec4 c = flag ? color : color.bgra;"
+     "for (int i = 0; i < 3; ++i) { if (i < count) c *= 0.75; } gl_FragColor = c; }"},
+    {"early exits", MOKA_PLAIN,
+     "precision mediump float; uniform vec4 color; uniform vec2 pair;"
+     "void main() { if (pair.x < 0.3) discard; gl_FragColor = color; if (pair.y < 0.5) return;"
+     "gl_FragColor.rgb *= gl_FragColor.a; }"},
+    {"samplers",
+     MOKA_VERTEX "varying highp vec2 at; void main() { at = uv; gl_Position = vec4(corner, 0.0, 1.0); }",
+     "precision highp float; uniform sampler2D texel; uniform lowp sampler2D mask; uniform vec4 color;"
+     "varying vec2 at;"
+     "void main() { gl_FragColor = texture2D(texel, at) * color + texture2D(mask, at, 0.0) * 0.5; }"},
+    {"GLSL ES 3.00",
+     "#version 300 es\nlayout(location = 0) in vec2 corner; layout(location = 1) in highp vec2 uv;\n"
+     "uniform mat4 matrix; out highp vec2 at; flat out highp int number_;\n"
+     "void main() { number_ = 1; at = uv; gl_Position = matrix * vec4(corner, 0, 1); }",
+     "#version 300 es\nprecision highp float; uniform vec4 color; uniform int count; uniform bool flag;\n"
+     "in vec2 at; flat in int number_; layout(location = 0) out vec4 result;\n"
+     "void main() { result = flag ? color * float(number_) : vec4(at, 0, 1); result.g = float(count) * 0.5; "
+     "}"},
+    {"attributes in another order than their names'",
+     "attribute vec2 zulu; attribute vec2 alpha; varying mediump vec2 at[2];"
+     "void main() { at[0] = alpha; at[1] = alpha.yx; gl_Position = vec4(zulu, 0.0, 1.0); }",
+     "precision mediump float; uniform float number; varying vec2 at[2];"
+     "void main() { gl_FragColor = vec4(at[0] * number, at[1].x, 1.0); }"},
+    {"gl_VertexID",
+     "#version 300 es\nin vec2 corner; void main() { gl_Position = vec4(corner, float(gl_VertexID) * 0.0, "
+     "1); }",
+     "#version 300 es\nuniform highp vec4 color; out highp vec4 c; void main() { c = color; }", false},
+    {"a name that GLSL ES 3.00 reserves", MOKA_PLAIN,
+     "precision highp float; uniform vec4 color; void main() { vec4 centroid = color; gl_FragColor = "
+     "centroid; }",
+     false},
+    {"a macro that declares", MOKA_PLAIN,
+     "#define INPUT uniform\nprecision highp float; INPUT vec4 color; void main() { gl_FragColor = color; }",
+     false},
+};
 
 constexpr int kColumns = 21;
 constexpr int kCell = 3; // pixels
@@ -123,34 +205,23 @@ protected:
     ProgramPtr program;
 };
 
-TEST_F(MergedProgramsTest, OnesThatAreUnderstoodDrawTheSameWithOneCall) {
-    for (Texts const& texts : kUnderstood) {
-        Picture const expected = DrawOneByOne(texts, 40);
-        Begin(true);
-        MakeProgram(texts);
-        DrawCells(40);
-        EXPECT_EQ(Flush(), 1) << texts.subject;
-        EXPECT_LE(CompareImages(ReadTarget(), expected).largest, 1) << texts.subject;
-        EXPECT_EQ(RendererFactory::GetStatistics().errors, 0u) << texts.subject;
-    }
-}
-
-TEST_F(MergedProgramsTest, OthersAreDrawnOneByOneAndSayWhyOnce) {
-    for (Texts const& texts : kForeign) {
+TEST_F(MergedProgramsTest, ThoseThatAreUnderstoodDrawWithOneCallAndOthersOneByOneAndSayWhyOnce) {
+    for (Texts const& texts : kPrograms) {
+        SCOPED_TRACE(texts.subject);
         Picture const expected = DrawOneByOne(texts, 40);
         Begin(true);
         LogCapture const log;
         MakeProgram(texts);
         for (int i = 0; i < 2; ++i) {
             DrawCells(40);
-            EXPECT_EQ(Flush(), 40) << texts.subject;
+            EXPECT_EQ(Flush(), texts.isMerged ? 1 : 40);
         }
-        EXPECT_EQ(log.Count(ANDROID_LOG_INFO, "foreign: draws with different values are not merged: "), 1)
-            << texts.subject;
-        EXPECT_EQ(log.Count(ANDROID_LOG_ERROR), 0) << texts.subject;
-        EXPECT_EQ(ReadTarget(), expected) << texts.subject;
-        EXPECT_EQ(RendererFactory::GetStatistics().errors, 0u) << texts.subject;
-        EXPECT_EQ(RendererFactory::GetStatistics().variants, 0) << texts.subject;
+        EXPECT_EQ(log.Count(ANDROID_LOG_INFO, "foreign: draws with different values are not merged: "),
+                  texts.isMerged ? 0 : 1);
+        EXPECT_EQ(log.Count(ANDROID_LOG_ERROR), 0);
+        EXPECT_LE(CompareImages(ReadTarget(), expected).largest, texts.isMerged ? 1 : 0);
+        EXPECT_EQ(RendererFactory::GetStatistics().errors, 0u);
+        EXPECT_EQ(RendererFactory::GetStatistics().variants, texts.isMerged ? 1 : 0);
     }
 }
 
@@ -211,77 +282,6 @@ TEST_F(MergedProgramsTest, AProgramHasSixteenVariantsAtMostAndTakesThemWithIt) {
     program.reset();
     EXPECT_EQ(CountGlPrograms(), before);
     EXPECT_EQ(RendererFactory::GetStatistics().variants, 0);
-}
-
-TEST_F(MergedProgramsTest, ValuesThatAreNoNumbersDoNotReachOtherDraws) {
-    auto const draw = [this](bool merges) {
-        Begin(merges);
-        MakeProgram(kWide);
-        image.target->Activate();
-        program->MakeCurrent();
-        for (int i = 0; i < 60; ++i) {
-            SetValues(i);
-            std::array<float, 4> nowhere{};
-            nowhere.fill(std::numeric_limits<float>::quiet_NaN());
-            if (i % 3 == 1) Set("color", BindingTypeVector4, nowhere);
-            if (i % 3 == 2) Set("number", BindingTypeFloat, nowhere[0]);
-            DrawCell(i);
-        }
-        RendererFactory::Flush();
-        EXPECT_EQ(RendererFactory::GetStatistics().errors, 0u);
-        return ReadTarget();
-    };
-    Picture const expected = draw(false);
-    Picture const merged = draw(true);
-    EXPECT_EQ(RendererFactory::GetStatistics().draws, 1u);
-    for (int i = 0; i < 60; i += 3) {
-        int const x = i % kColumns * kCell + 1;
-        int const y = i / kColumns * kCell + 1;
-        EXPECT_EQ(merged.GetColor(x, y), expected.GetColor(x, y)) << i;
-    }
-}
-
-// Edges that pass through the centres of pixels: the last bit of a position decides over each.
-TEST_F(MergedProgramsTest, PositionsAgreeToTheBit) {
-    constexpr Texts kTurned{
-        "turned",
-        "attribute vec2 corner; uniform mat4 matrix; uniform vec2 pair; uniform highp float number;"
-        "void main() { vec2 p = (corner * pair * 1.5 + number) / number - 1.0;"
-        "gl_Position = matrix * vec4(p, 0.0, 1.0); }",
-        "precision highp float; uniform vec4 color; void main() { gl_FragColor = color; }"};
-    BlendStateDescriptor add(true);
-    add.SetColorEquation(BlendingFunction::Add, BlendingFactor::One, BlendingFactor::One);
-    add.SetAlphaEquation(BlendingFunction::Add, BlendingFactor::One, BlendingFactor::One);
-    auto const draw = [&](bool merges) {
-        Begin(merges);
-        MakeProgram(kTurned);
-        BlendPtr const blend(RendererFactory::CreateBlendStateObject(add));
-        blend->Apply();
-        image.target->Activate();
-        program->MakeCurrent();
-        Set("color", BindingTypeVector4, std::array<float, 4>{2 / 255.0f, 0, 0, 0});
-        for (int i = 0; i < 100; ++i) {
-            // A cell of three pixels that grows by three and turns by an angle whose tangent is a ratio of two odd
-            // numbers.
-            std::array<float, 16> matrix{};
-            matrix[0] = matrix[5] = static_cast<float>(i % 3 * 2 + 1) / 3;
-            matrix[1] = static_cast<float>(i % 5 * 2 + 1) / 3;
-            matrix[4] = -matrix[1];
-            matrix[12] = static_cast<float>(i % 9 - 4) * 2 / kTargetSize;
-            matrix[15] = 1;
-            float const number = 0.7f + static_cast<float>(i) * 0.013f;
-            Set("matrix", BindingTypeMatrix4, matrix);
-            Set("pair", BindingTypeVector2, std::array<float, 2>{2 * number, 2 * number});
-            Set("number", BindingTypeFloat, number);
-            DrawCell(kColumns * kColumns / 2);
-        }
-        RendererFactory::Flush();
-        return ReadTarget();
-    };
-    Picture const expected = draw(false);
-    EXPECT_FALSE(expected == MakeImage(kTargetSize, kTargetSize, kClear));
-    EXPECT_EQ(draw(true), expected);
-    EXPECT_EQ(RendererFactory::GetStatistics().draws, 1u);
 }
 
 } // namespace

@@ -338,9 +338,9 @@ private:
         Fill(brush, color, x, y, x + static_cast<float>(box.w), y + static_cast<float>(box.h));
         Draw(box, writesColor, [&](int, int) { return color; });
     }
-    // Texel on pixel.
+    // Texel on pixel, so that an image may be drawn onto itself.
     void PaintImage(std::size_t number) {
-        if (number == mActive || number == 2 || mActive == 2) return;
+        if (number == 2 || mActive == 2) return;
         ApplyStates(true, true);
         Box const box{Below(6), Below(6), 3, 3};
         Paint(*mImages[number].real.texture, static_cast<float>(box.x), static_cast<float>(box.y),

@@ -74,7 +74,7 @@ Brush MakeBrush(Picture const& image, Sampler const& sampler, BitmapQuad const& 
                 }
                 return ink;
             },
-            [blur](PointD const&) { return blur; }};
+            blur};
 }
 
 bool Composes(MKPaint const& paint) {

@@ -105,7 +105,7 @@ ReferencePixel ReferenceDraw::Store(View const& view, ReferencePixel const& befo
 double ReferenceDraw::GetBlur(Brush const& brush, PointD const& p, Rgba const& exact,
                               Rgba const& basis) const {
     double sum = 0;
-    for (PointD const& d : brush.blur(p)) {
+    for (PointD const& d : *brush.blur) {
         sum += std::max(Distance(Mix(Touch(brush, {p.x + d.x, p.y + d.y}), basis, basis), exact),
                         Distance(Mix(Touch(brush, {p.x - d.x, p.y - d.y}), basis, basis), exact));
     }

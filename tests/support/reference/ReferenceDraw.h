@@ -24,8 +24,8 @@ struct Ink {
 struct Brush {
     RectF bounds;
     std::function<std::optional<Ink>(PointD const&)> at;
-    // How far off in two directions the point may be at which a texture is sampled. Null without a texture.
-    std::function<std::array<PointD, 2>(PointD const&)> blur{};
+    // How far off in two directions the point may be at which a texture is sampled. Nothing without a texture.
+    std::optional<std::array<PointD, 2>> blur{};
 };
 
 // What one draw puts down, in order.

@@ -103,20 +103,6 @@ TEST_F(TextureBitmap, ACloneMadeBeforeAnythingRanShowsTheImage) {
               TextureWrapRepeat);
 }
 
-TEST_F(TextureBitmap, ReleasedInEitherOrderTheImageLivesToTheLast) {
-    Pixels const pixels = UniquePixels(4, 4);
-    for (bool parentFirst : {true, false}) {
-        auto parent = NewBitmap(4, 4, pixels.data());
-        auto clone = BitmapPtr::Adopt(parent->Clone());
-        auto grandchild = BitmapPtr::Adopt(clone->Clone());
-        (parentFirst ? parent : grandchild) = {};
-        clone = {};
-        queue.RunAll();
-        EXPECT_EQ(ReadAll(parentFirst ? grandchild : parent), pixels);
-        EXPECT_EQ(RendererFactory::GetStatistics().textures, 1) << "one storage";
-    }
-}
-
 TEST_F(TextureBitmap, ReleasedBeforeItsTasksRanItStillCleansUp) {
     MKGraphicsFactory::ReleaseBitmap([this] {
         auto const parent = NewBitmap(4, 2 * kMaxSide);

@@ -89,25 +89,6 @@ TEST_F(Clipping, FractionsTruncateTowardsZeroOnTexturesAndOnTheScreen) {
     }
 }
 
-TEST_F(Clipping, RectanglesIntersectFromTheLastReplaceOn) {
-    Clip(0, 0, 20, 20);
-    Clip(10, 5, 40, 40);
-    EXPECT_EQ(Scissor(), (ScissorRect{10, 5, 10, 15}));
-    Clip(30, 30, 5, 5);
-    EXPECT_EQ(Scissor(), (ScissorRect{0, kHeight, 0, 0})) << "disjoint";
-    Clip(1, 2, 30, 30, Replace);
-    Clip(11, 12, 30, 30);
-    EXPECT_EQ(Scissor(), (ScissorRect{11, 12, 20, 20}));
-    EXPECT_THAT(log.GetTexts(ANDROID_LOG_WARN), IsEmpty());
-
-    Use(NewBitmap(50, kMaxSide + 36)); // every strip has its part
-    Clip(10, 50, 20, 30);
-    canvas->DrawRect(0, 0, 50, 1000, &paint);
-    std::vector<TracedDraw> const draws = TakeDraws();
-    ASSERT_THAT(draws, SizeIs(2));
-    EXPECT_EQ(draws[1].state.scissor, (ScissorRect{10, -14, 20, 30}));
-}
-
 TEST_F(Clipping, TheScissorServesWhereOneRectangleWillDo) {
     canvas->SetMatrix(Matrix3<float>(1, 5, 0, 0, 1, 0, 0, 0, 1)); // element 1 is not looked at
     Clip(0, 0, 20, 20, IMKCanvasBase::Difference);                // nor is the operation of a single one
@@ -159,20 +140,6 @@ TEST_F(Clipping, AStencilIsThereForOneDrawAndDrawnAnewForTheNext) {
     canvas->Restore(-1); // resets the clip
     PipelineState const unclipped = DrawAndTakeState();
     EXPECT_FALSE(unclipped.scissorOn || unclipped.depthStencil.IsStencil());
-}
-
-// Clears and what else the stencil is drawn with, each draw of it apart from the next.
-TEST_F(Clipping, StatesAndProgramAreThereBeforeTheFirstStencilClear) {
-    Clip(1, 1, 9, 9, Union);
-    Clip(1, 1, 9, 9, Union);
-    canvas->Clear(0, 0, 0, 1); // without a drawable of its own
-    queue.RunAll();
-    std::vector<std::string> steps;
-    for (TracedCall const& call : RendererTrace::GetCalls()) {
-        if (call.operation == "ClearDepthStencil") break;
-        if (call.operation == "Apply" || call.operation == "MakeCurrent") steps.push_back(call.object);
-    }
-    EXPECT_THAT(steps, ElementsAre("blend 1", "depthstencil 1", "program 1"));
 }
 
 TEST_F(Clipping, AClippedDrawLeavesTheScissorAsItWasAndAnUnclippedOneOff) {

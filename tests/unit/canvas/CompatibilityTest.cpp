@@ -1,6 +1,11 @@
 // Behaviour of docs/compatibility.md that no other test sees.
-#include "moka/graphics/loader/MKBitmapSaveManager.h"
+#include "moka/graphics/task/WorkerTask.h"
+#include "moka/renderer/IRenderTarget.h"
+#include "moka/renderer/IRendererDeviceCaps.h"
 #include "tests/unit/canvas/CanvasFixture.h"
+#include <cstdint>
+#include <cstring>
+#include <gtest/gtest.h>
 
 namespace Moka::Testing {
 namespace {
@@ -44,12 +49,34 @@ TEST_F(Compatibility, SamplingOfATextureBitmapDropsNoReference) {
     EXPECT_EQ(CountOf(bitmap.Get()), 1);
 }
 
-TEST_F(Compatibility, ASaveThatTheLoaderRefusesStaysCounted) {
-    auto const empty = BitmapPtr::Adopt(
-        MKGraphicsFactory::CreateBitmap(&queue, reinterpret_cast<TextureObject const*>(this), 1));
-    MKBitmapSaveManager manager;
-    EXPECT_FALSE(manager.RequestSave(1, "a.png", *empty, nullptr, 100));
-    EXPECT_EQ(manager.GetRequestSaveCount(), 1);
+// Where a virtual function stands in its table: in the Itanium ABI a pointer to one holds its offset plus
+// one.
+template <class F>
+std::size_t SlotOf(F function) {
+    static_assert(sizeof(function) == 2 * sizeof(std::uintptr_t));
+    std::uintptr_t words[2];
+    std::memcpy(words, &function, sizeof words);
+#if defined(__aarch64__)
+    return words[0] / sizeof(void*);
+#else
+    return (words[0] - 1) / sizeof(void*);
+#endif
+}
+
+TEST(VirtualOrder, CallersFindEachFunctionInItsSlot) {
+    EXPECT_EQ(SlotOf(&IGLMsgQueue::Post), 2u);
+    EXPECT_EQ(SlotOf(&IGLMsgQueue::WaitForTasks), 3u);
+    EXPECT_EQ(SlotOf(&ITask::run), 2u);
+    EXPECT_EQ(SlotOf(&ITask::isGlobalLockAllowed), 3u);
+    EXPECT_EQ(SlotOf(&IRendererDeviceCaps::GetMaxTextureSize), 2u);
+    using T = IRenderTarget;
+    std::size_t const slots[] = {
+        SlotOf(&T::Activate),           SlotOf(&T::Deactivate),
+        SlotOf(&T::ReadPixels),         SlotOf(&T::Release),
+        SlotOf(&T::ClearColor),         SlotOf(&T::AttachDepthStencil),
+        SlotOf(&T::DetachDepthStencil), SlotOf(&T::ClearDepthStencil),
+    };
+    for (std::size_t i = 0; i < 8; ++i) EXPECT_EQ(slots[i], i);
 }
 
 } // namespace

@@ -2,6 +2,7 @@
 #include "moka/base/log/AndroidLog.h"
 #include "tests/unit/canvas/CanvasFixture.h"
 
+#include <gtest/gtest.h>
 #include <stdexcept>
 
 namespace Moka::Testing {

@@ -29,62 +29,47 @@ TEST_F(FrontEnd, ARequestHasTheMatrixOfItsTimeAndWithoutAPaintANewOne) {
     EXPECT_EQ(draw.state.scissor, (ScissorRect{5, 6, 10, 10}));
     EXPECT_THAT(draw.uniforms.at("uColor").numbers, ElementsAre(1, 1, 1, 1));
     EXPECT_EQ(draw.state.blend.GetColorEquation().destination, BlendingFactor::OneMinusSrcAlpha);
+    canvas->SetMatrix(m);
+    canvas->DrawRoundRect(-90, -90, 90, 90, 5, 0, &paint);
+    EXPECT_EQ(TakeDraw().shader, "MKRectShader") << "a radius of 0 makes no corners";
 }
 
-TEST_F(FrontEnd, ARoundRectangleNeedsBothRadii) {
-    for (auto const& [rx, ry] : {std::pair(0.0f, 5.0f), {5.0f, 0.0f}, {5.0f, -1.0f}, {kNaN, 5.0f}}) {
-        canvas->DrawRoundRect(1, 2, 30, 40, rx, ry, &paint);
-        EXPECT_EQ(TakeDraw().shader, "MKRectShader");
-    }
-    canvas->DrawRoundRect(1, 2, 30, 40, 3, 5, &paint);
-    EXPECT_THAT(TakeDraws(), SizeIs(2)) << "body and corners";
-}
-
+// A, M and C save all, the matrix or the clip, U with an unknown flag; > moves by 1, # clips; a digit restores that
+// level, - the last one, ~ level -2.
 TEST_F(FrontEnd, SavedLevelsHoldMatrixAndClipCountOrThePreviousOnes) {
-    auto const clip = [&] { canvas->SetClipRect(0, 0, 10, 10, IMKCanvasBase::Intersect); };
-    auto const move = [&] { canvas->PreTranslate(1, 0); };
-    auto const x = [&] { return canvas->GetMatrix().getTranslateX(); };
-    // Whether the clip of a draw right now is on.
-    auto const isClipped = [&] {
+    struct {
+        char const* steps;
+        float x;
+        bool isClipped;
+    } const cases[] = {
+        {"-0>", 1, false},          // there is none
+        {">A>#MCU>4", 3, true},     // nor this one
+        {">A>#MCU>3", 2, true},     // the matrix of level 1, the count of level 2
+        {">A>#MCU>3>1", 2, false},  // level 1 had the count of level 0
+        {">A>#MCU>3>1~", 1, false}, // any negative level is the last one
+        {">#C0", 0, true},          // saving one part alone resets the other
+        {"M#-", 0, false},
+    };
+    for (auto const& [steps, x, isClipped] : cases) {
+        Use(NewBitmap(50, 50));
+        int levels = 0;
+        for (char const* step = steps; *step != 0; ++step) {
+            std::size_t const flag = std::string("AMCU").find(*step);
+            if (flag != std::string::npos)
+                EXPECT_EQ(canvas->Save(static_cast<IMKCanvasBase::SaveFlag>(flag)), levels++) << steps;
+            else if (*step == '>')
+                canvas->PreTranslate(1, 0);
+            else if (*step == '#')
+                canvas->SetClipRect(0, 0, 10, 10, IMKCanvasBase::Intersect);
+            else
+                canvas->Restore(*step == '-' ? -1 : *step == '~' ? -2 : *step - '0');
+        }
+        EXPECT_EQ(canvas->GetMatrix().getTranslateX(), x) << steps;
         queue.RunAll();
         RendererTrace::TakeEvents();
         canvas->DrawRect(-99, -99, 99, 99, &paint);
-        return TakeDraw().state.scissorOn;
-    };
-    canvas->Restore(-1);
-    canvas->Restore(0);
-    move();
-    EXPECT_EQ(canvas->Save(IMKCanvasBase::SaveAll), 0);
-    move();
-    clip();
-    EXPECT_EQ(canvas->Save(IMKCanvasBase::SaveMatrix), 1);
-    EXPECT_EQ(canvas->Save(IMKCanvasBase::SaveClip), 2);
-    EXPECT_EQ(canvas->Save(static_cast<IMKCanvasBase::SaveFlag>(3)), 3);
-    move();
-    canvas->Restore(4);
-    EXPECT_EQ(x(), 3);
-    EXPECT_TRUE(isClipped());
-    canvas->Restore(3);
-    EXPECT_EQ(x(), 2) << "the matrix of level 1, through 2";
-    EXPECT_TRUE(isClipped()) << "the count of level 2";
-    move();
-    canvas->Restore(1);
-    EXPECT_EQ(x(), 2);
-    EXPECT_FALSE(isClipped()) << "level 1 had the count of level 0";
-    canvas->Restore(-2);
-    EXPECT_EQ(x(), 1);
-    canvas->Restore(-1);
-    EXPECT_EQ(x(), 1);
-
-    clip(); // saving one part alone resets the other
-    EXPECT_EQ(canvas->Save(IMKCanvasBase::SaveClip), 0);
-    canvas->Restore(0);
-    EXPECT_TRUE(canvas->GetMatrix().isIdentity());
-    EXPECT_TRUE(isClipped());
-    canvas->Save(IMKCanvasBase::SaveMatrix);
-    clip();
-    canvas->Restore(-1);
-    EXPECT_FALSE(isClipped());
+        EXPECT_EQ(TakeDraw().state.scissorOn, isClipped) << steps;
+    }
 }
 
 TEST_F(FrontEnd, ASourceIsHeldUntilDrawnAndWhatCannotBeDrawnIsNotPosted) {
@@ -146,62 +131,6 @@ TEST_F(FrontEnd, RefusedRequestsAreDroppedAndOnlyTheReferencesStay) {
     PipelineState const state = TakeDraw().state;
     EXPECT_TRUE(state.scissorOn);
     EXPECT_EQ(state.scissor.width, 0);
-}
-
-TEST_F(FrontEnd, WhatWasRefusedLeavesItsReferencesAndObjectsBehind) {
-    canvas = {};
-    auto bitmap = NewBitmap(4, 4);
-    auto const screen = NewScreen(4, 4);
-    queue.RunAll();
-    IMKSubBitmap* const strip = StripOf(bitmap);
-    int const alive = RendererTrace::CountLiveObjects();
-    refuse = true;
-    strip->SetTag("never seen");
-    EXPECT_EQ(strip->GetPixel(Point(1, 1)), 0u);
-    EXPECT_EQ(CountOf(strip), 3);
-    EXPECT_EQ(screen->GetPixel(Point(1, 1)), 0u);
-    screen->GetBitmapWritable()->ActivateFrameBuffer();
-    EXPECT_EQ(CountOf(screen.Get()), 3);
-    auto clone = BitmapPtr::Adopt(MKGraphicsFactory::CreateBitmap(&queue, bitmap.Get(), 1));
-    EXPECT_EQ(CountOf(clone.Get()), 2);
-    EXPECT_EQ(CountOf(StripOf(clone)), 2);
-    EXPECT_EQ(CountOf(strip), 4);
-    // What the refusals have leaked.
-    clone->Unref();
-    StripOf(clone)->Unref();
-    for (int i = 0; i < 3; ++i) strip->Unref();
-    for (int i = 0; i < 2; ++i) screen->Unref();
-    refuse = false;
-    clone = {};
-    queue.RunAll();
-    ITextureObject* const texture = strip->GetTexture();
-    refuse = true;
-    bitmap = {};
-    refuse = false;
-    EXPECT_EQ(RendererTrace::CountLiveObjects(), alive) << "the texture, whose deletion was refused";
-    OnRenderThread const here;
-    delete texture;
-}
-
-TEST_F(FrontEnd, ARefusedDeletionLeavesTheRenderSideAlive) {
-    canvas = {};
-    queue.RunAll();
-    int held = 0;
-    RefusingQueue some(RefusingQueue::Predicate([&](int ordinal, ITask* task) {
-        if (ordinal == 1) return false; // creates the clip
-        held = CountOf(target.Get());
-        OnRenderThread const here;
-        task->run(); // which gives its references back
-        return true;
-    }));
-    auto onSome = CanvasPtr::Adopt(MKGraphicsFactory::CreateCanvas(&some, target.Get(), 1));
-    {
-        OnRenderThread const here;
-        some.RunAll();
-    }
-    onSome = {};
-    EXPECT_EQ(held, 3);
-    EXPECT_EQ(some.GetRefusedCount(), 1);
 }
 
 TEST_F(FrontEnd, ARequestAllocatesNothingButItsTask) {

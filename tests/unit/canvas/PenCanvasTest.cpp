@@ -45,32 +45,6 @@ TEST_F(PenCanvas, TheClipIsThatOfTheWholeBitmapWhateverTheIndexAndReachesGl) {
     EXPECT_THAT(calls, ::testing::Not(Contains(HasSubstr("AttachDepthStencil")))) << "no strip's own";
 }
 
-TEST_F(PenCanvas, ItClearsWithinItsClipAndGivesTheTargetBack) {
-    target = NewBitmap(50, 60);
-    for (bool direct : {false, true}) {
-        queue.RunAll();
-        if (direct) RendererTrace::DeclareRenderThread();
-        RendererTrace::TakeEvents();
-        auto pen = PenCanvasPtr::Adopt(MKGraphicsFactory::CreatePenCanvas(&queue, target.Get(), !direct));
-        EXPECT_EQ(CountOf(target.Get()), 3);
-        pen->Save(IMKCanvasBase::SaveAll);
-        pen->SetClipRect(1, 2, 20, 30, IMKCanvasBase::Intersect);
-        pen->Clear(static_cast<int>(0xFFFF0000u));
-        pen->ClearAll(0, 0, 1, 1);
-        pen->Restore(0);
-        pen->Clear(0, 1, 0, 1);
-        pen = {};
-        EXPECT_EQ(queue.RunAll() == 0, direct);
-        std::vector<TracedClear> const clears = RendererTrace::GetClears();
-        ASSERT_THAT(clears, SizeIs(3));
-        EXPECT_EQ(clears[0].color, (std::array<float, 4>{1, 0, 0, 1}));
-        EXPECT_EQ(clears[0].state.scissor, (ScissorRect{1, 2, 20, 30}));
-        EXPECT_FALSE(clears[1].state.scissorOn || clears[2].state.scissorOn);
-        EXPECT_EQ(CountOf(target.Get()), 1);
-        RendererTrace::DeclareNoRenderThread();
-    }
-}
-
 TEST_F(PenCanvas, OnAScreenBitmapOnlyItsLocalStateWorks) {
     auto const screen = NewScreen(50, 60);
     queue.RunAll();

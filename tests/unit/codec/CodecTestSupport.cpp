@@ -7,7 +7,7 @@
 
 #include <algorithm>
 #include <cmath>
-#include <gtest/gtest.h>
+#include <gmock/gmock.h>
 #include <memory>
 #include <random>
 #include <turbojpeg.h>
@@ -95,21 +95,16 @@ Bytes ReadBytes(std::string const& path) {
     return Bytes(content.begin(), content.end());
 }
 
-ErrorLines::ErrorLines()
-    : mBefore(SetLogSink([this](LogLine const& line) {
-          EXPECT_EQ(line.priority, ANDROID_LOG_ERROR) << line.text;
-          EXPECT_EQ(line.tag, "mok_log") << line.text;
-          mLines.push_back(line.text);
-      })) {}
-
-ErrorLines::~ErrorLines() {
-    SetLogSink(mBefore);
-    EXPECT_TRUE(mLines.empty()) << "unexpected: " << mLines.front();
-}
+ErrorLines::~ErrorLines() { EXPECT_THAT(Take(), ::testing::IsEmpty()); }
 
 std::vector<std::string> ErrorLines::Take() {
     std::vector<std::string> lines;
-    lines.swap(mLines);
+    for (LogLine const& line : GetLines()) {
+        EXPECT_EQ(line.priority, ANDROID_LOG_ERROR) << line.text;
+        EXPECT_EQ(line.tag, "mok_log") << line.text;
+        lines.push_back(line.text);
+    }
+    Clear();
     return lines;
 }
 

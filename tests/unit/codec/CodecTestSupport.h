@@ -2,8 +2,8 @@
 #pragma once
 
 #include "moka/base/BitmapFactory.h"
-#include "moka/base/log/LogSink.h"
 #include "tests/support/ImageCompare.h"
+#include "tests/support/LogCapture.h"
 #include "tests/support/TestFiles.h"
 
 #include <cstdint>
@@ -33,18 +33,10 @@ void WriteBytes(std::string const& path, Bytes const& bytes);
 Bytes ReadBytes(std::string const& path);
 
 // Error lines while it lives. Everything else fails the test: codecs have nothing else to say.
-class ErrorLines {
+class ErrorLines : public LogCapture {
 public:
-    ErrorLines();
     ~ErrorLines();
-    ErrorLines(ErrorLines const&) = delete;
-    ErrorLines& operator=(ErrorLines const&) = delete;
-
     std::vector<std::string> Take();
-
-private:
-    std::vector<std::string> mLines;
-    LogSink mBefore;
 };
 
 // Empty images when the factory returns null.

@@ -121,35 +121,6 @@ TEST_F(CustomDrawablesTest, GpuObjectsAreMadeAndReleasedByTasksInOrder) {
     }
 }
 
-TEST_F(CustomDrawablesTest, ARefusedConstructionLeavesADrawableThatDrawsNothingAndLivesOn) {
-    refuse = true;
-    for (Maker const& make : Makers()) {
-        IMKCustomDrawable* const drawable = make(&queue);
-        EXPECT_FALSE(Draws(*drawable));
-        EXPECT_EQ(drawable->Unref(), 1); // the task's reference stays
-        EXPECT_EQ(drawable->Unref(), 0);
-    }
-    refuse = false;
-}
-
-TEST_F(CustomDrawablesTest, ARefusedReleaseLeaksThatObjectAndNothingElse) {
-    // After the construction and three releases.
-    RefusingQueue refusesTheProgram(
-        RefusingQueue::Predicate([](int ordinal, ITask*) { return ordinal == 5; }));
-    RunOnRenderThread(refusesTheProgram);
-    int const alive = RendererTrace::CountLiveObjects();
-    Makers()[2](&refusesTheProgram)->Unref();
-    refusesTheProgram.RunAll();
-    EXPECT_EQ(RendererTrace::CountLiveObjects(), alive + 1 + 3); // with its parameters
-
-    OnRenderThread const here;
-    ShaderManager& manager = *ShaderManager::GetInstance();
-    auto* const leaked = manager.GetShader<MKTextMaskBitmapShader>();
-    manager.ReleaseShader(leaked);
-    manager.ReleaseShader(leaked);
-    EXPECT_EQ(RendererTrace::CountLiveObjects(), alive);
-}
-
 TEST_F(CustomDrawablesTest, SettersTakeReferencesAndAConstructorAdoptsThem) {
     auto const drawable = Constructed(NewBlended(&queue, 8, 8));
     EXPECT_EQ(CountOf(first.Get()), 2);

@@ -1,10 +1,16 @@
-// DrawableFixture: drawables over the tracing renderer, and what reached it of them.
+// DrawableFixture: shaders and drawables over the tracing renderer, and what reached it of them.
 #pragma once
 
+#include "moka/base/log/AndroidLog.h"
+#include "moka/graphics/drawable/ShaderManager.h"
+#include "moka/graphics/drawable/Shaders.h"
 #include "moka/graphics/paint/MKPaint.h"
 #include "moka/renderer/IBlendStateObject.h"
 #include "moka/renderer/IDepthStencilState.h"
-#include "tests/unit/drawable/ShaderFixture.h"
+#include "tests/support/LogCapture.h"
+#include "tests/support/RendererTrace.h"
+
+#include <gmock/gmock.h>
 
 #include <cstddef>
 #include <limits>
@@ -56,6 +62,27 @@ inline void ForceOtherStates() {
     state->Apply();
     state->Release();
 }
+
+// Shaders on the render thread. Every test ends with nothing alive that was not before, and nothing misused.
+class ShaderFixture : public ::testing::Test {
+protected:
+    void SetUp() override {
+        RendererTrace::Reset();
+        ASSERT_TRUE(RendererFactory::AttachContext());
+        expectedAlive = RendererTrace::CountLiveObjects();
+    }
+
+    void TearDown() override {
+        EXPECT_EQ(RendererTrace::CountLiveObjects(), expectedAlive);
+        EXPECT_THAT(RendererTrace::GetViolations(), ::testing::IsEmpty());
+        RendererFactory::DetachContext();
+        RendererTrace::Reset();
+    }
+
+    ShaderManager& manager = *ShaderManager::GetInstance();
+    LogCapture log;
+    int expectedAlive = 0; // for the tests that leak on purpose
+};
 
 class DrawableFixture : public ShaderFixture {
 protected:

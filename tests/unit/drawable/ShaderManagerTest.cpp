@@ -1,6 +1,6 @@
 #include "moka/graphics/drawable/ShaderExceptions.h"
 #include "tests/support/Awaited.h"
-#include "tests/unit/drawable/ShaderFixture.h"
+#include "tests/unit/drawable/DrawableFixture.h"
 
 #include <atomic>
 #include <chrono>

@@ -10,6 +10,7 @@
 #include <cstring>
 #include <set>
 #include <thread>
+#include <utility>
 #include <vector>
 
 namespace Moka::Testing {
@@ -20,34 +21,21 @@ using detail::FreeTask;
 
 constexpr std::size_t kSizes[] = {1, 16, 64, 65, 128, 129, 192, 193, 256, 257, 384, 385, 4096};
 
-// A block in use, filled with a value of its own that nobody else may change.
-struct Block {
-    unsigned char* memory = nullptr;
-    std::size_t size = 0;
-    unsigned char mark = 0;
-
-    static Block Make(std::size_t size, unsigned char mark) {
-        auto* const memory = static_cast<unsigned char*>(AllocateTask(size));
-        if (memory) std::memset(memory, mark, size);
-        return {memory, size, mark};
-    }
-    bool IsIntact() const {
-        return std::all_of(memory, memory + size, [this](unsigned char byte) { return byte == mark; });
-    }
-    void Free() const { FreeTask(memory, size); }
-};
-
 TEST(TaskMemoryTest, GivesBlocksOfTheirOwnOnCacheLinesOfTheirOwn) {
-    std::vector<Block> blocks;
+    std::vector<std::pair<unsigned char*, std::size_t>> blocks; // each filled with its number
     for (int i = 0; i < 100; ++i) {
         for (std::size_t const size : kSizes) {
-            blocks.push_back(Block::Make(size, static_cast<unsigned char>(blocks.size())));
-            ASSERT_NE(blocks.back().memory, nullptr);
-            ASSERT_EQ(reinterpret_cast<std::uintptr_t>(blocks.back().memory) % detail::kTaskAlignment, 0u);
+            auto* const memory = static_cast<unsigned char*>(AllocateTask(size));
+            ASSERT_NE(memory, nullptr);
+            ASSERT_EQ(reinterpret_cast<std::uintptr_t>(memory) % detail::kTaskAlignment, 0u);
+            std::memset(memory, static_cast<unsigned char>(blocks.size()), size);
+            blocks.emplace_back(memory, size);
         }
     }
-    for (Block const& block : blocks) ASSERT_TRUE(block.IsIntact()) << block.size;
-    for (Block const& block : blocks) block.Free();
+    unsigned char number = 0;
+    for (auto const& [memory, size] : blocks)
+        ASSERT_EQ(std::count(memory, memory + size, number++), static_cast<std::ptrdiff_t>(size));
+    for (auto const& [memory, size] : blocks) FreeTask(memory, size);
     FreeTask(nullptr, 64);
     FreeTask(nullptr);
 }

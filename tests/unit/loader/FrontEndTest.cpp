@@ -61,21 +61,6 @@ TYPED_TEST(EitherFrontEnd, CallsBackAndLogsPathsInEngineeringBuildsOnly) {
     }
 }
 
-TYPED_TEST(EitherFrontEnd, DestroyedWhileDecodingItCallsNobodyAndDoesNotWait) {
-    String const path = this->WritePicture("a.mki");
-    auto callback = MakeCallback<TypeParam>(this->listener);
-    CodecGate gate;
-    {
-        TypeParam loader("pad", &callback);
-        loader.RequestLoad(1, path, this->queue.get());
-        loader.RequestLoad(2, path, this->queue.get());
-        gate.AwaitArrival();
-    } // returns with the gate still closed
-    gate.Open();
-    this->AwaitAll();
-    EXPECT_EQ(this->listener.GetEvents(), Events{});
-}
-
 TYPED_TEST(EitherFrontEnd, DestroyedWhileCallingItWaitsForTheCall) {
     String const path = this->WritePicture("a.mki");
     Awaited<bool> entered, mayLeave;

@@ -19,25 +19,6 @@ std::vector<float> ElementsOf(Matrix const& m) {
     return {m.data(), m.data() + sizeof(m) / sizeof(float)};
 }
 
-Vector4<float> Map(Matrix4f const& m, Vector4<float> const& p) {
-    auto const at = [&](int i) { return m(i, 0) * p.x + m(i, 1) * p.y + m(i, 2) * p.z + m(i, 3) * p.w; };
-    return {at(0), at(1), at(2), at(3)};
-}
-
-TEST(Matrix3Test, StorageIsColumnMajor) {
-    EXPECT_EQ(kCounting(0, 1), 3);
-    EXPECT_THAT(
-        (std::vector<float>{kCounting.getScaleX(), kCounting.getScaleY(), kCounting.getSkewX(),
-                            kCounting.getSkewY(), kCounting.getTranslateX(), kCounting.getTranslateY()}),
-        ElementsAre(0, 4, 3, 1, 6, 7));
-    EXPECT_EQ(Matrix3f(kCounting.data()), kCounting);
-    Matrix3f m(3.5f);
-    m.zeroSelf();
-    EXPECT_EQ(m, Matrix3f(0.0f));
-    m.identitySelf();
-    EXPECT_EQ(m, Matrix3f());
-}
-
 TEST(Matrix3Test, EqualityIsByBitsIdentityByValue) {
     Matrix3f m;
     m[3] = -0.0f;
@@ -96,32 +77,12 @@ TEST(Matrix3Test, TheDeterminantIsExactlyZeroOrItDivides) {
     EXPECT_EQ(singular.inverse(), singular);
 }
 
-TEST(Matrix3Test, MapRectIsTheBoxOfTheCornersDividedByW) {
-    RectF box(1, 2, 3, 4);
-    Matrix3f::scaleMatrix(2, 2).mapRect(&box, box);
-    EXPECT_EQ(box, RectF(2, 4, 6, 8));
-    Rect pixels;
-    Matrix3f::scaleMatrix(0.5f, -0.5f).mapRect(&pixels, Rect(1, 1, 4, 5));
-    EXPECT_EQ(pixels, Rect(0, -3, 2, 0));
-    Matrix3f perspective;
-    perspective[2] = 0.5f;
-    perspective[5] = 0.25f;
-    perspective.mapRect(&box, RectF(0, 0, 2, 4)); // w is 1, 3, 2 and 2
-    EXPECT_EQ(box, RectF(0, 0, 1, 2));
-}
-
-TEST(Matrix4Test, ProjectionsMapTheCornersOfTheirVolume) {
-    float const w = 640, h = 480;
-    Matrix4f const m = Matrix4f::orthoMatrix(0, w, h, 0, -1, 1);
-    EXPECT_EQ(Map(m, {0, 0, 0, 1}), Vector4<float>(-1, 1, 0, 1));
-    EXPECT_EQ(Map(m, {w, h, 0, 1}), Vector4<float>(1, -1, 0, 1));
-    float const top = std::tan(90.0f * 0.008726646f); // takes degrees and halves them
+// Degrees, halved.
+TEST(Matrix4Test, APerspectiveIsMadeOfTheTangentOfHalfItsAngle) {
+    float const top = std::tan(90.0f * 0.008726646f);
     EXPECT_EQ(Matrix4f::perspectiveMatrix(90, 1, 1, 100),
               Matrix4f(2 / (2 * top), 0, 0, 0, 0, 2 / (2 * top), 0, 0, 0, 0, -101.0f / 99.0f, -1, 0, 0,
                        -200.0f / 99.0f, 0));
-    // (10 + 80 + 7, 20 + 100 + 8) over a w of 30 + 120 + 9.
-    EXPECT_EQ(Map(FromMatrix3(Matrix3f(1, 2, 3, 4, 5, 6, 7, 8, 9)), {10, 20, 5, 1}),
-              Vector4<float>(97, 128, 5, 159));
 }
 
 } // namespace

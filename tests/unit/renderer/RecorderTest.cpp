@@ -12,6 +12,7 @@
 #include <gtest/gtest.h>
 
 #include <cstring>
+#include <memory>
 #include <thread>
 #include <utility>
 
@@ -108,6 +109,10 @@ TEST_F(RecorderTest, AProgramBuiltAgainInANewContextKeepsItsValuesAndHandles) {
     RendererFactory::DetachContext();
     value = 3;
     width->Set(&value);
+    IShaderProgram* const homeless =
+        RendererFactory::CreateShaderProgram("", "uniform float uWidth;", "Late");
+    std::unique_ptr<IParameterBinding> early(homeless->GetParameter("uWidth"));
+    EXPECT_EQ(early->GetType(), BindingTypeUnknown);
     RendererFactory::AttachContext();
     EXPECT_EQ(RendererFactory::GetStatistics().programs, 0);
     program->MakeCurrent();
@@ -116,6 +121,13 @@ TEST_F(RecorderTest, AProgramBuiltAgainInANewContextKeepsItsValuesAndHandles) {
     value = 4;
     width->Set(&value);
     EXPECT_EQ(GetWidthInForce(), 4);
+    // One that was created without a context takes values once it was built.
+    homeless->MakeCurrent();
+    early.reset(homeless->GetParameter("uWidth"));
+    value = 5;
+    early->Set(&value);
+    EXPECT_EQ(GetWidthInForce(), 5);
+    homeless->Release();
 }
 
 TEST_F(RecorderTest, WhatAnotherThreadDropsIsDeletedByTheNextRequestThatFindsItUnused) {

@@ -2,6 +2,7 @@
 #include "scenes/Picture.h"
 #include "scenes/SceneError.h"
 #include "scenes/SceneFile.h"
+#include "scenes/SceneRecorder.h"
 #include "scenes/SceneText.h"
 #include "tests/support/LogCapture.h"
 #include "tests/support/TestFiles.h"
@@ -28,11 +29,11 @@ using Calls = std::function<void(IMKCanvas&, IMKBitmap* checker, IMKBitmap* phot
 
 // Operations on blue, with the bitmaps "checker" and "photo", draw what the calls draw, and something. The probe
 // after both shows what they leave of the canvas's state.
-void ExpectDraws(std::string const& operations, Calls const& calls, std::string const& paints = "") {
+void ExpectDraws(std::string const& operations, Calls const& calls) {
     SCOPED_TRACE(operations);
     std::string const probe = R"({"DrawBitmap": {"bitmap": "checker", "dst": [6, 5, 30, 20]}})";
     std::string const begin =
-        R"({"size": [40, 30], "background": [0, 0, 0.5, 0.5], "paints": {)" + paints + R"(},
+        R"({"size": [40, 30], "background": [0, 0, 0.5, 0.5],
         "bitmaps": {"checker": {"picture": "checker", "width": 12, "height": 10},
                     "photo": {"picture": "photo", "width": 7, "height": 3}}, "operations": [)";
     auto const paint = [&](std::string const& drawn) {
@@ -62,145 +63,99 @@ std::string FindError(std::string const& text) {
     return "no error";
 }
 
+// The canvas's calls that a scene becomes, as the recorder writes them down.
+std::string RecordOperations(std::string const& paints, std::string const& operations) {
+    Scene const scene =
+        ParseScene("{\"size\": [40, 30], \"paints\": {" + paints + "}, \"operations\": [" + operations + "]}",
+                   "test", "");
+    TempFolder const folder;
+    auto const recorder = Scenes::SceneRecorder::Start(folder.Path("scene.json"), 40, 30);
+    ReferenceStage stage;
+    scene.draw(*recorder, stage);
+    EXPECT_TRUE(recorder->Close());
+    return ReadFile(folder.Path("scene.json"));
+}
+
 TEST(SceneFormat, OperationsAreTheCanvassOwn) {
-    std::pair<char const*, Calls> const cases[] = {
-        {R"({"DrawRect": {"rect": [1, 2, 33.5, 4]}})",
-         [](auto& c, auto*...) { c.DrawRect(1, 2, 33.5f, 4, nullptr); }},
-        {R"({"DrawRoundRect": {"rect": [1, 2, 33, 26], "rx": 3, "ry": 5}})",
-         [](auto& c, auto*...) { c.DrawRoundRect(1, 2, 33, 26, 3, 5, nullptr); }},
-        {R"({"DrawCircle": {"cx": 5, "cy": 6, "radius": 4}})",
-         [](auto& c, auto*...) { c.DrawCircle(5, 6, 4, nullptr); }},
-        {R"({"DrawLine": {"from": [1, 2], "to": [39, 4]}})",
-         [](auto& c, auto*...) { c.DrawLine(1, 2, 39, 4, nullptr); }},
-        {R"({"DrawSimpleLine": {"from": [1, 2], "to": [39, 4]}})",
-         [](auto& c, auto*...) { c.DrawSimpleLine(1, 2, 39, 4, nullptr); }},
-        {R"({"DrawSimpleLines": {"points": [[1, 2], [39, 4], [5, 25], [35, 28]]}})",
-         [](auto& c, auto*...) {
-             c.DrawSimpleLines({{1, 2}, {39, 4}, {5, 25}, {35, 28}}, nullptr);
-         }},
-        {R"({"SetClipRect": {"x": 2, "y": 3, "width": 20, "height": 9}}, {"Clear": {"color": "#00FF00"}})",
-         [](auto& c, auto*...) {
-             c.SetClipRect(2, 3, 20, 9, IMKCanvasBase::Intersect);
-             c.Clear(0, 1, 0, 1);
-         }},
-        {R"({"SetClipRect": {"x": 2, "y": 3, "width": 4, "height": 9}}, {"ClearAll": {"color": [0, 0.5, 1, 0.25]}})",
-         [](auto& c, auto*...) {
-             c.SetClipRect(2, 3, 4, 9, IMKCanvasBase::Intersect);
-             c.ClearAll(0, 0.5f, 1, 0.25f);
-         }},
-        {R"({"SetMatrix": {"matrix": [1, 0.5, 0, 0.25, 2, 0, 7, -8, 1]}})",
-         [](auto& c, auto*...) {
-             c.SetMatrix({1, 0.5f, 0, 0.25f, 2, 0, 7, -8, 1});
-         }},
-        {R"({"PreScale": {"sx": 1.5, "sy": 0.5}}, {"PostConcat": {"matrix": [1, 0, 0, 0.5, 1, 0, 4, 2, 1]}},
-            {"PreTranslate": {"tx": 1, "ty": 2}}, {"PostTranslate": {"tx": -3, "ty": 4}},
-            {"PreRotate": {"degrees": 9}}, {"PreConcat": {"matrix": [1, 0.25, 0, 0, 1, 0, 0, 0, 1]}},
-            {"PostScale": {"sx": 0.75, "sy": 1.25}}, {"PostRotate": {"degrees": -20, "px": 5, "py": 6}})",
-         [](auto& c, auto*...) {
-             c.PreScale(1.5f, 0.5f);
-             c.PostConcat({1, 0, 0, 0.5f, 1, 0, 4, 2, 1});
-             c.PreTranslate(1, 2);
-             c.PostTranslate(-3, 4);
-             c.PreRotate(9);
-             c.PreConcat({1, 0.25f, 0, 0, 1, 0, 0, 0, 1});
-             c.PostScale(0.75f, 1.25f);
-             c.PostRotate(-20, 5, 6);
-         }},
-        {R"({"DrawBitmap": {"bitmap": "photo", "x": 1, "y": 2}})",
-         [](auto& c, auto*, auto* photo) { c.DrawBitmap(photo, 1, 2, nullptr); }},
-        {R"({"DrawBitmap": {"bitmap": "photo", "dst": [1, 2, 30, 4]}})",
-         [](auto& c, auto*, auto* photo) { c.DrawBitmap(photo, RectF(1, 2, 30, 4), nullptr); }},
-        {R"({"DrawBitmap": {"bitmap": "checker", "src": [0, 1, 2, 3], "dst": [1, 2, 30, 24]}})",
-         [](auto& c, auto* b, auto*) { c.DrawBitmap(b, RectF(0, 1, 2, 3), RectF(1, 2, 30, 24), nullptr); }},
-        {R"({"DrawBitmaps": {"bitmap": "photo", "points": [[1, 2], [30, 20]]}})",
-         [](auto& c, auto*, auto* photo) {
-             std::vector<PointF> points{{1, 2}, {30, 20}};
-             c.DrawBitmaps(photo, points, nullptr);
-         }},
-        {R"({"DrawBitmaps": {"bitmap": "photo", "dsts": [[1, 2, 30, 4]]}})",
-         [](auto& c, auto*, auto* photo) { c.DrawBitmaps(photo, {RectF(1, 2, 30, 4)}, nullptr); }},
-        {R"({"DrawBitmaps": {"bitmap": "checker", "src": [1, 0, 12, 10], "paint": {"alpha": 0.5},
-                "dsts": {"columns": 3, "rows": 2, "from": [1, 14], "step": [9, 4], "size": [20, 9]}}})",
-         [](auto& c, auto* b, auto*) {
-             std::vector<RectF> dsts; // row by row; they show through each other
-             MKPaint half;
-             half.SetAlpha(0.5f);
-             for (int i = 0; i < 6; ++i) {
-                 int const column = i % 3, row = i / 3;
-                 auto const x = static_cast<float>(1 + 9 * column), y = static_cast<float>(14 + 4 * row);
-                 dsts.emplace_back(x, y, x + 20, y + 9);
-             }
-             c.DrawBitmaps(b, RectF(1, 0, 12, 10), dsts, &half);
-         }},
+    std::pair<char const*, char const*> const cases[] = {
+        {R"({"DrawRect": {"rect": [1, 2, 33.5, 4], "paint": "p1"}})", nullptr},
+        {R"({"DrawRoundRect": {"rect": [1, 2, 33, 26], "rx": 3, "ry": 5, "paint": "p1"}})", nullptr},
+        {R"({"DrawCircle": {"cx": 5, "cy": 6, "radius": 4, "paint": "p1"}})", nullptr},
+        {R"({"DrawLine": {"from": [1, 2], "to": [39, 4], "paint": "p1"}})", nullptr},
+        {R"({"DrawSimpleLine": {"from": [1, 2], "to": [39, 4], "paint": "p1"}})", nullptr},
+        {R"({"DrawSimpleLines": {"points": [[1, 2], [39, 4], [5, 25], [35, 28]], "paint": "p1"}})", nullptr},
+        {R"({"Save": {}})", R"({"Save": {"flag": 0}})"},
+        {R"({"Save": {"flag": "SaveClip"}})", R"({"Save": {"flag": 2}})"},
+        {R"({"Restore": {"level": 3}})", nullptr},
+        {R"({"Clear": {"color": "#00FF00"}})", R"({"Clear": {"color": [0, 1, 0, 1]}})"},
+        {R"({"ClearAll": {"color": [0, 0.5, 1, 0.25]}})", nullptr},
+        {R"({"SetMatrix": {"matrix": [1, 0.5, 0, 0.25, 2, 0, 7, -8, 1]}})", nullptr},
+        {R"({"PreConcat": {"matrix": [1, 0.25, 0, 0, 1, 0, 0, 0, 1]}})", nullptr},
+        {R"({"PostConcat": {"matrix": [1, 0, 0, 0.5, 1, 0, 4, 2, 1]}})", nullptr},
+        {R"({"PreScale": {"sx": 1.5, "sy": 0.5}})", nullptr},
+        {R"({"PostScale": {"sx": 0.75, "sy": 1.25}})", nullptr},
+        {R"({"PreTranslate": {"tx": 1, "ty": 2}})", nullptr},
+        {R"({"PostTranslate": {"tx": -3, "ty": 4}})", nullptr},
+        {R"({"PreRotate": {"degrees": 9}})", nullptr},
+        {R"({"PostRotate": {"degrees": -20, "px": 5, "py": 6}})", nullptr},
     };
-    for (auto const& [operations, calls] : cases) ExpectDraws(operations, calls);
-    std::pair<char const*, IMKCanvasBase::ClipOp> const ops[] = {
-        {"Replace", IMKCanvasBase::Replace},
-        {"Union", IMKCanvasBase::Union},
-        {"Xor", IMKCanvasBase::Xor},
-        {"Difference", IMKCanvasBase::Difference},
-        {"ReverseDifference", IMKCanvasBase::ReverseDifference}};
-    for (auto const& pair : ops) {
-        std::string const clip = R"({"SetClipRect": {"x": 2, "y": 3, "width": 20, "height": 9}},
-            {"SetClipRect": {"x": 15, "y": 8, "width": 20, "height": 9, "op": ")";
-        ExpectDraws(clip + pair.first + "\"}}", [op = pair.second](auto& c, auto*...) {
-            c.SetClipRect(2, 3, 20, 9, IMKCanvasBase::Intersect);
-            c.SetClipRect(15, 8, 20, 9, op);
-        });
+    for (auto const& [given, recorded] : cases)
+        EXPECT_THAT(RecordOperations(R"("p1": {})", given), HasSubstr(recorded ? recorded : given));
+    char const* const ops[] = {"Intersect", "Replace", "Union", "Xor", "Difference", "ReverseDifference"};
+    for (int op = IMKCanvasBase::Intersect; op <= IMKCanvasBase::ReverseDifference; ++op) {
+        std::string const clip = R"({"SetClipRect": {"x": 2, "y": 3, "width": 20, "height": 9, "op": )";
+        EXPECT_THAT(RecordOperations("", clip + '"' + ops[op] + "\"}}"),
+                    HasSubstr(clip + std::to_string(op) + "}}"));
     }
 }
 
+TEST(SceneFormat, BitmapsAreDrawnInEveryWay) {
+    ExpectDraws(R"(
+        {"DrawBitmap": {"bitmap": "photo", "x": 1, "y": 2}},
+        {"DrawBitmap": {"bitmap": "photo", "dst": [12, 2, 30, 4]}},
+        {"DrawBitmap": {"bitmap": "checker", "src": [0, 1, 2, 3], "dst": [32, 2, 39, 5]}},
+        {"DrawBitmaps": {"bitmap": "photo", "points": [[1, 7], [30, 21]]}},
+        {"DrawBitmaps": {"bitmap": "photo", "dsts": [[1, 21, 10, 29]]}},
+        {"DrawBitmaps": {"bitmap": "checker", "src": [1, 0, 12, 10], "paint": {"alpha": 0.5},
+            "dsts": {"columns": 3, "rows": 2, "from": [1, 14], "step": [9, 4], "size": [20, 9]}}})",
+                [](auto& c, auto* checker, auto* photo) {
+                    c.DrawBitmap(photo, 1, 2, nullptr);
+                    c.DrawBitmap(photo, RectF(12, 2, 30, 4), nullptr);
+                    c.DrawBitmap(checker, RectF(0, 1, 2, 3), RectF(32, 2, 39, 5), nullptr);
+                    std::vector<PointF> points{{1, 7}, {30, 21}};
+                    c.DrawBitmaps(photo, points, nullptr);
+                    c.DrawBitmaps(photo, {RectF(1, 21, 10, 29)}, nullptr);
+                    std::vector<RectF> dsts; // row by row; they show through each other
+                    for (float const y : {14.0f, 18.0f})
+                        for (float const x : {1.0f, 10.0f, 19.0f}) dsts.emplace_back(x, y, x + 20, y + 9);
+                    MKPaint half;
+                    half.SetAlpha(0.5f);
+                    c.DrawBitmaps(checker, RectF(1, 0, 12, 10), dsts, &half);
+                });
+}
+
 TEST(SceneFormat, PaintsCarryEveryPropertyAndBuildOnEachOther) {
-    std::string const paints = R"(
+    std::string const text = RecordOperations(R"(
         "pen": {"color": "#80FF0000", "style": "Stroke", "lineWidth": 2.5, "antiAliasing": true},
         "dashed": {"base": "pen", "color": [0, 0, 1], "alpha": 0.5, "dashedLinePattern": [4, 2],
-                   "lineCapType": "Square"})";
-    MKPaint pen;
-    pen.SetColor(static_cast<int>(0x80FF0000));
-    pen.SetStyle(MKPaint::Stroke);
-    pen.SetLineWidth(2.5f);
-    pen.SetAntiAliasing(true);
-    MKPaint dashed = pen;
-    dashed.SetColor(0, 0, 1);
-    dashed.SetAlpha(0.5f);
-    dashed.SetDashedLinePattern({4, 2, 4, 2});
-    dashed.SetLineCapType(MKPaint::Square);
-    ExpectDraws(R"({"DrawLine": {"from": [3, 3], "to": [35, 25], "paint": "dashed"}})",
-                [&](auto& c, auto*...) { c.DrawLine(3, 3, 35, 25, &dashed); }, paints);
-    dashed.SetDashedLinePattern({1, 2, 3, 4});
-    ExpectDraws(
-        R"({"DrawLine": {"from": [3, 3], "to": [35, 25],
-                         "paint": {"base": "dashed", "dashedLinePattern": [1, 2, 3, 4]}}})",
-        [&](auto& c, auto*...) { c.DrawLine(3, 3, 35, 25, &dashed); }, paints);
-    pen.SetStyle(MKPaint::FillAndStroke);
-    pen.SetAlpha(0.25f); // in the place of the colour's
-    ExpectDraws(
-        R"({"DrawCircle": {"cx": 11, "cy": 12, "radius": 9, "paint": {"base": "pen", "style": "FillAndStroke", "alpha": 0.25}}})",
-        [&](auto& c, auto*...) { c.DrawCircle(11, 12, 9, &pen); }, paints);
-    MKPaint tinted;
-    tinted.SetTintColor(static_cast<int>(0x8000FF00));
-    tinted.SetXFermode(MKPaint::DstOut);
-    ExpectDraws(
-        R"({"DrawBitmap": {"bitmap": "checker", "dst": [1, 2, 38, 29],
-                           "paint": {"tintColor": "#8000FF00", "xfermode": "DstOut"}}})",
-        [&](auto& c, auto* b, auto*) { c.DrawBitmap(b, RectF(1, 2, 38, 29), &tinted); });
-    MKPaint tiled;
-    tiled.SetTileMode(MKPaint::Mirror, MKPaint::Repeat);
-    ExpectDraws(
-        R"({"DrawBitmap": {"bitmap": "checker", "src": [0, 0, 30, 40], "dst": [1, 2, 38, 29],
-                           "paint": {"tileMode": ["Mirror", "Repeat"]}}})",
-        [&](auto& c, auto* b, auto*) { c.DrawBitmap(b, RectF(0, 0, 30, 40), RectF(1, 2, 38, 29), &tiled); });
-    MKPaint numbered;
-    numbered.SetXFermode(MKPaint::SrcKeepDstAlpha);
-    numbered.SetTileMode(MKPaint::Clamp, MKPaint::Clamp);
-    std::string const number = std::to_string(MKPaint::SrcKeepDstAlpha);
-    for (std::string const& mode : {number, std::string("\"SrcKeepDstAlpha\"")})
-        ExpectDraws(R"({"DrawBitmap": {"bitmap": "checker", "src": [0, 0, 30, 40], "dst": [1, 2, 38, 29],
-                         "paint": {"tileMode": "Clamp", "xfermode": )" +
-                        mode + "}}}",
-                    [&](auto& c, auto* b, auto*) {
-                        c.DrawBitmap(b, RectF(0, 0, 30, 40), RectF(1, 2, 38, 29), &numbered);
-                    });
+                   "lineCapType": "Square"})",
+                                              R"(
+        {"DrawCircle": {"cx": 1, "cy": 2, "radius": 9, "paint": "pen"}},
+        {"DrawCircle": {"cx": 1, "cy": 2, "radius": 9, "paint": "dashed"}},
+        {"DrawCircle": {"cx": 1, "cy": 2, "radius": 9,
+                        "paint": {"base": "dashed", "dashedLinePattern": [1, 2, 3, 4], "style": "FillAndStroke"}}},
+        {"DrawCircle": {"cx": 1, "cy": 2, "radius": 9, "paint": {"base": "pen", "alpha": 0.25}}},
+        {"DrawCircle": {"cx": 1, "cy": 2, "radius": 9,
+                        "paint": {"tintColor": "#8000FF00", "xfermode": "DstOut", "tileMode": ["Mirror", "Repeat"]}}},
+        {"DrawCircle": {"cx": 1, "cy": 2, "radius": 9, "paint": {"tileMode": "Clamp", "xfermode": 6}}})");
+    EXPECT_THAT(text, HasSubstr(R"(
+    "p1": {"color": [1, 0, 0, 0.5019608], "style": "Stroke", "lineWidth": 2.5, "antiAliasing": true},
+    "p2": {"color": [0, 0, 1, 0.5], "style": "Stroke", "lineWidth": 2.5, "antiAliasing": true, "dashedLinePattern": [4, 2, 4, 2], "lineCapType": "Square"},
+    "p3": {"color": [0, 0, 1, 0.5], "style": "FillAndStroke", "lineWidth": 2.5, "antiAliasing": true, "dashedLinePattern": [1, 2, 3, 4], "lineCapType": "Square"},
+    "p4": {"color": [1, 0, 0, 0.25], "style": "Stroke", "lineWidth": 2.5, "antiAliasing": true},
+    "p5": {"tintColor": [0, 1, 0, 0.5019608], "xfermode": "DstOut", "tileMode": ["Mirror", "Repeat"]},
+    "p6": {"xfermode": "DstOver", "tileMode": ["Clamp", "Clamp"]}},)"));
+    static_assert(MKPaint::DstOver == 6);
 }
 
 TEST(SceneFormat, GroupsArePlacedClippedRepeatedAndLeaveNothingBehind) {
@@ -250,6 +205,7 @@ TEST(SceneFormat, AMistakeInTheFileIsNamedWithItsPlace) {
     ExpectNamed({
         {"", "1:1: this is no JSON: syntax error"},
         {"{\n\"size\": [8, 6],\n}", "3:1: this is no JSON: syntax error"},
+        {"{\"size\": tru\n}", "1:13: this is no JSON: syntax error"}, // the line break belongs to its line
         {"{\n\"size\": [8, 1e999]}", "2:13: this is no JSON: number overflow"},
         {"{\n\n\"size\": [8, 1e39]}", "3:13: a number is too large"},
         {"{\"size\": [8, 6],\n  \"size\": [8, 6]}", "2:3: \"size\" is given twice"},
