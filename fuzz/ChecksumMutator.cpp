@@ -1,9 +1,9 @@
 // Mutates PNG and "mki" files and, mostly, puts their checksums right again: else nearly every change would
 // be refused for its checksum, and what comes after would hardly be reached.
-#include <algorithm>
 #include <cstddef>
 #include <cstdint>
 #include <cstring>
+#include <endian.h>
 #include <zlib.h>
 
 extern "C" std::size_t LLVMFuzzerMutate(std::uint8_t* data, std::size_t size, std::size_t maxSize);
@@ -17,34 +17,27 @@ constexpr std::size_t kMkiChecked = 24;
 constexpr std::size_t kMkiHeader = 32;
 constexpr unsigned kLeaveOneIn = 16;
 
-void StoreBigEndian(std::uint8_t* to, std::uint32_t value) {
-    for (int i = 0; i < 4; ++i) to[i] = static_cast<std::uint8_t>(value >> (24 - 8 * i));
-}
-
-std::uint32_t LoadBigEndian(std::uint8_t const* from) {
-    std::uint32_t value = 0;
-    for (int i = 0; i < 4; ++i) value = value << 8 | from[i];
-    return value;
+std::uint32_t Checksum(std::uint8_t const* data, std::size_t size) {
+    return static_cast<std::uint32_t>(crc32(0, data, static_cast<uInt>(size)));
 }
 
 void RepairPng(std::uint8_t* data, std::size_t size) {
-    std::size_t at = kPngSignature;
-    while (at + kChunkAround <= size) {
-        std::size_t const length = LoadBigEndian(data + at);
+    std::uint32_t length = 0;
+    for (std::size_t at = kPngSignature; at + kChunkAround <= size; at += kChunkAround + length) {
+        std::memcpy(&length, data + at, 4);
+        length = be32toh(length);
         if (length > size - at - kChunkAround) return;
-        auto const checksum = crc32(0, data + at + 4, static_cast<uInt>(length + 4));
-        StoreBigEndian(data + at + 8 + length, static_cast<std::uint32_t>(checksum));
-        at += kChunkAround + length;
+        std::uint32_t const checksum = htobe32(Checksum(data + at + 4, length + 4));
+        std::memcpy(data + at + 8 + length, &checksum, 4);
     }
 }
 
 void RepairMki(std::uint8_t* data, std::size_t size) {
     if (size < kMkiHeader) return;
-    std::uint64_t const payload = size - kMkiHeader;
-    for (int i = 0; i < 8; ++i) data[16 + i] = static_cast<std::uint8_t>(payload >> (8 * i));
-    auto const checksum = crc32(0, data, static_cast<uInt>(kMkiChecked));
-    for (int i = 0; i < 4; ++i)
-        data[kMkiChecked + static_cast<std::size_t>(i)] = static_cast<std::uint8_t>(checksum >> (8 * i));
+    std::uint64_t const payload = htole64(size - kMkiHeader);
+    std::memcpy(data + 16, &payload, 8);
+    std::uint32_t const checksum = htole32(Checksum(data, kMkiChecked));
+    std::memcpy(data + kMkiChecked, &checksum, 4);
 }
 
 } // namespace

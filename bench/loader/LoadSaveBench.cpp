@@ -2,6 +2,7 @@
 // comparison, two loops on one thread: the codecs alone, and the codecs with upload and read-back between
 // them. "ratio" is the loader's time divided by that of the codecs, "ratio_pipeline" divided by that of the
 // second loop; both are medians.
+#include "bench/loader/InkPage.h"
 #include "moka/base/Bitmap.h"
 #include "moka/base/BitmapFactory.h"
 #include "moka/base/RefPtr.h"
@@ -13,7 +14,6 @@
 #include "moka/graphics/loader/MKBitmapLoader.h"
 #include "moka/graphics/loader/MKBitmapSaveManager.h"
 #include "moka/host/RenderThread.h"
-#include "tests/support/TestImages.h"
 
 #include <benchmark/benchmark.h>
 
@@ -55,8 +55,8 @@ RenderThread& Queue() {
 }
 
 // A gradient with noise, which compresses like a photograph.
-Testing::Picture MakePhoto(unsigned seed) {
-    Testing::Picture image(kSide, kSide);
+Scenes::Picture MakePhoto(unsigned seed) {
+    Scenes::Picture image(kSide, kSide);
     std::mt19937 random(seed);
     for (int y = 0; y < kSide; ++y) {
         for (int x = 0; x < kSide; ++x) {
@@ -76,11 +76,11 @@ public:
         mFolder = (std::filesystem::is_directory(memory) ? memory : std::filesystem::temp_directory_path()) /
                   ("moka_loader_bench_" + std::to_string(getpid()));
         std::filesystem::create_directories(mFolder);
-        Testing::Picture photo = MakePhoto(1);
-        Testing::Picture page = Testing::MakeInkPage(kSide, kSide);
+        Scenes::Picture photo = MakePhoto(1);
+        Scenes::Picture page = Bench::MakeInkPage(kSide, kSide);
         for (int i = 0; i < kPictures; ++i) {
             bool const isPhoto = i % 2 == 0;
-            Testing::Picture& image = isPhoto ? photo : page;
+            Scenes::Picture& image = isPhoto ? photo : page;
             mInputs.emplace_back((mFolder / (std::to_string(i) + (isPhoto ? ".jpg" : ".png"))).string());
             mOutputs.emplace_back((mFolder / ("out" + std::to_string(i) + "." + extension)).string());
             Bitmap bitmap;

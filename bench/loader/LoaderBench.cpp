@@ -1,12 +1,12 @@
 // Measures the loader's queue: requests with an empty decode, compared with a plain thread and queue;
 // queueing and cancelling many requests; and the latency of a cancel while a picture is being decoded. Log
 // lines, about ten for each request, are formatted and dropped.
+#include "bench/loader/InkPage.h"
 #include "moka/base/Bitmap.h"
 #include "moka/base/BitmapFactory.h"
 #include "moka/base/String.h"
 #include "moka/base/log/LogSink.h"
 #include "moka/graphics/loader/BitmapLoader.h"
-#include "tests/support/TestImages.h"
 
 #include <benchmark/benchmark.h>
 
@@ -209,7 +209,7 @@ BENCHMARK(QueueAndCancelAll)
 class PictureFile {
 public:
     PictureFile() {
-        Testing::Picture image = Testing::MakeInkPage(2048, 2048);
+        Scenes::Picture image = Bench::MakeInkPage(2048, 2048);
         Bitmap bitmap;
         bitmap.Construct(image.pixels.data(), image.width, image.height, image.GetStride(), 1, false, false);
         if (!BitmapFactory::SaveBitmap(&bitmap, &mPath, 100)) std::abort();

@@ -9,14 +9,16 @@
 namespace Moka::detail {
 
 /// 8 bytes of an object of any type, at any alignment.
-using AnyWord = std::uint64_t __attribute__((may_alias, aligned(1)));
+struct __attribute__((packed, may_alias)) AnyWord {
+    std::uint64_t bits;
+};
 
 /// This is one expression because compilers vectorise a loop to 16-byte loads. If two separate 8-byte stores
 /// wrote these bytes just before, the load stalls until both have left the store buffer (no store
 /// forwarding).
 template <std::size_t... kIndices>
 bool HasSameWords(AnyWord const* a, AnyWord const* b, std::index_sequence<kIndices...>) {
-    return ((a[kIndices] ^ b[kIndices]) | ...) == 0;
+    return ((a[kIndices].bits ^ b[kIndices].bits) | ...) == 0;
 }
 
 /// Returns true if the first kBytes bytes of a and b are equal. kBytes is a multiple of 8.

@@ -59,7 +59,7 @@ TEST_F(BatchTest, ABrokenFileStopsNoOtherAndIsNamedInItsTurnWithItsReason) {
     for (int i = 10; i < 70; ++i) {
         std::string const name = std::to_string(i);
         inputs.push_back(name + ".png");
-        Save(MakeInkPage(i % 4 == 3 ? 90 : 40, 30), inputs.back());
+        Save(MakeAlphaPattern(i % 4 == 3 ? 90 : 40, 30), inputs.back());
         if (i % 2 == 0) present.push_back(name + ".mki");
         switch (i % 4) {
         case 0:
@@ -82,7 +82,7 @@ TEST_F(BatchTest, ABrokenFileStopsNoOtherAndIsNamedInItsTurnWithItsReason) {
     EXPECT_THAT(result.out, StartsWith("15 of 60 images -> out/ (mki), "));
     EXPECT_THAT(result.err, MatchesRegex(told));
     EXPECT_EQ(List("out"), present);
-    for (std::string const& name : good) ExpectSamePixels(MakeInkPage(40, 30), "out/" + name);
+    for (std::string const& name : good) ExpectSamePixels(MakeAlphaPattern(40, 30), "out/" + name);
 }
 
 TEST_F(BatchTest, NamesMayHoldAnyBytes) {

@@ -71,20 +71,16 @@ TEST_F(DrawTest, WatchingDrawsAgainWhenTheFileChanges) {
         WriteFile("next.json", "{\"size\": [" + size + "], \"operations\": []}");
         std::filesystem::rename(Path("next.json"), Path("s.json"));
     };
-    auto const waitForWidth = [this](int width) {
-        for (int i = 0; i < 1000 && Load("out.png").width != width; ++i)
-            std::this_thread::sleep_for(std::chrono::milliseconds(10));
-        return Load("out.png").width;
-    };
+    auto const becomes = [this](int width) { return Soon([&] { return Load("out.png").width == width; }); };
     write("4, 3");
     Save(MakeGradient(2, 2), "out.png");
     MokaProcess process(mFolder.string(), Arguments("draw --watch s.json -o out.png"));
-    EXPECT_EQ(waitForWidth(4), 4);
+    EXPECT_TRUE(becomes(4));
     write("\"wide\", 3");
     std::this_thread::sleep_for(std::chrono::milliseconds(600));
     EXPECT_EQ(Load("out.png").width, 4);
     write("5, 3");
-    EXPECT_EQ(waitForWidth(5), 5);
+    EXPECT_TRUE(becomes(5));
     process.Signal(SIGINT);
     ProcessResult const result = process.Wait();
     EXPECT_EQ(result.signal, SIGINT);

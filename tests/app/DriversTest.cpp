@@ -10,6 +10,7 @@
 #include <array>
 #include <cstdio>
 #include <fstream>
+#include <map>
 
 namespace Moka::Testing {
 namespace {
@@ -25,12 +26,8 @@ constexpr double kMostOnEdges = 0.0015;
 // OpenGL ES allows): it moves shapes by up to 1/32 on both axes, as far as the reference's five bits allow for.
 constexpr int kSubpixelBits = 5;
 
-struct Bound {
-    char const* scene;
-    int steps;
-};
 // Scenes that the reference cannot draw.
-constexpr Bound kBounds[] = {
+std::map<std::string, int> const kBounds = {
     {"bitmap-scaled", 64}, // grain of single texels; at a tenth of its size, 1/32 pixel is a third of a texel
     {"non-premultiplied", 8}, // divides by an alpha down to 0.15, which makes a step up to seven
     {"note", 255},            // single pixels of its slim triangles; few: see kMostOnEdges
@@ -45,10 +42,8 @@ Slack FindAllowed(Scene const& scene) {
     auto const canvas = RefPtr<ReferenceCanvas>::Adopt(new ReferenceCanvas(*bitmap, {4096, kSubpixelBits}));
     ReferenceStage stage;
     if (!scene.needsGpu) DrawScene(scene, *canvas, stage);
-    int least = kRounding;
-    for (Bound const& bound : kBounds) {
-        if (scene.name == bound.scene) least = bound.steps;
-    }
+    auto const bound = kBounds.find(scene.name);
+    int const least = bound == kBounds.end() ? kRounding : bound->second;
     Slack allowed = canvas->GetSlack();
     for (int y = 0; y < scene.height; ++y) {
         for (int x = 0; x < scene.width; ++x) allowed.Set(x, y, std::max(least, allowed.Get(x, y)));

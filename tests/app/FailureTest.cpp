@@ -104,7 +104,7 @@ TEST_F(FailureTest, WhatCannotBeReadOrWrittenIsNamedWithItsReason) {
     for (auto const& [arguments, parts] : kRefusals) ExpectFails(arguments, kFailed, parts);
     ExpectFails({"convert", "two\nlines.png", "old.png"}, kFailed, "lines.png");
     for (std::string const name : {"cut.png", "cut.jpg", "cut.webp", "cut.mki"}) {
-        Save(MakeInkPage(90, 70), name);
+        Save(MakeAlphaPattern(90, 70), name);
         Truncate(name);
         ExpectFails("convert " + name + " old.png", kFailed, name + "|truncated");
     }

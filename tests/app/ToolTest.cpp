@@ -30,14 +30,6 @@ void ToolTest::Truncate(std::string const& name) const {
     fs::resize_file(Path(name), fs::file_size(Path(name)) / 2);
 }
 
-std::vector<std::string> ToolTest::List(std::string const& folder) const {
-    std::vector<std::string> names;
-    for (auto const& entry : fs::directory_iterator(mFolder / folder))
-        names.push_back(entry.path().filename().string());
-    std::sort(names.begin(), names.end());
-    return names;
-}
-
 ProcessResult ToolTest::Run(Arguments const& arguments, ProcessOptions const& options) const {
     return MokaProcess(mFolder.string(), arguments, options).Wait();
 }

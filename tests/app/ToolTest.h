@@ -39,7 +39,7 @@ protected:
     // Empty when the file cannot be decoded.
     Picture Load(std::string const& name) const { return LoadImage(Path(name)); }
     // Sorted; everything, hidden files as well.
-    std::vector<std::string> List(std::string const& folder = ".") const;
+    std::vector<std::string> List(std::string const& folder = ".") const { return mTemporary.List(folder); }
 
     ProcessResult Run(Arguments const& arguments, ProcessOptions const& options = {}) const;
     // Fails the test unless the tool succeeds without a word on stderr.

@@ -10,11 +10,9 @@
 
 #include <gtest/gtest.h>
 
-#include <chrono>
 #include <cstdio>
 #include <filesystem>
 #include <string>
-#include <thread>
 
 namespace Moka::Testing {
 namespace {
@@ -36,21 +34,8 @@ Picture DrawWithoutWindow(int width, int height) {
     return image;
 }
 
-// For some seconds: the sanitizers and a cold disk take their time.
-template <class Condition>
-bool Soon(Condition const& holds) {
-    for (int i = 0; i < 600; ++i) {
-        if (holds()) return true;
-        std::this_thread::sleep_for(std::chrono::milliseconds(50));
-    }
-    return false;
-}
-
 // Edges may be rounded otherwise, since a window's rows lie the other way round in GL.
-bool IsSame(Picture const& a, Picture const& b) {
-    ImageDifference const difference = CompareImages(a, b);
-    return difference.largest <= 3;
-}
+bool IsSame(Picture const& a, Picture const& b) { return CompareImages(a, b).largest <= 3; }
 
 TEST(ExampleTest, ShowsThePictureAtEverySizeAndCloses) {
     ProcessOptions options;
@@ -63,22 +48,18 @@ TEST(ExampleTest, ShowsThePictureAtEverySizeAndCloses) {
     std::string const messages = program.GetError();
     if (messages.find("no GLES context") != std::string::npos) GTEST_SKIP() << messages;
     ASSERT_TRUE(isThere) << messages;
-    struct Size {
-        int width;
-        int height;
-    };
-    for (Size const size : {Size{320, 240}, Size{480, 360}, Size{220, 300}}) {
-        window.Resize(size.width, size.height);
-        Picture const expected = DrawWithoutWindow(size.width, size.height);
+    for (auto const& [width, height] : {std::pair(320, 240), std::pair(480, 360), std::pair(220, 300)}) {
+        window.Resize(width, height);
+        Picture const expected = DrawWithoutWindow(width, height);
         Picture seen(1, 1);
-        EXPECT_TRUE(Soon([&] {
-            if (window.Find(size.width, size.height)) seen = window.Grab(size.width, size.height);
+        EXPECT_TRUE(Soon([&, width = width, height = height] {
+            if (window.Find(width, height)) seen = window.Grab(width, height);
             return program.IsOver() || IsSame(expected, seen);
         }));
         EXPECT_TRUE(IsSame(expected, seen))
             << CompareImages(expected, seen)
             << KeepDifference(expected, seen, std::filesystem::path(theProgram).filename());
-        EXPECT_TRUE(SaveImage(seen, theProgram + "-" + std::to_string(size.width) + ".png"));
+        EXPECT_TRUE(SaveImage(seen, theProgram + "-" + std::to_string(width) + ".png"));
     }
     window.Close();
     EXPECT_TRUE(Soon([&] { return program.IsOver(); }));

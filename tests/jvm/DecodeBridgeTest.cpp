@@ -32,7 +32,7 @@ constexpr char const* kNotLoaded = "MKBitmapFactory : gDecodeFile Not loaded";
 // Loads the bridge where one name is missing.
 int LoadWithout(char const* name) {
     JNIEnv* const env = JavaMachine::GetMainEnv();
-    MissingName const missing(env, name);
+    PatchedFunctions const missing(env, name);
     int const result = MKBitmapFactory_OnLoad(JavaMachine::GetVm(), env);
     EXPECT_FALSE(env->ExceptionCheck()) << name;
     return result;

@@ -19,11 +19,9 @@ bool IsAttached() {
 std::string GetJavaThreadName(JNIEnv* env) {
     jclass const type = env->FindClass("java/lang/Thread");
     jmethodID const current = env->GetStaticMethodID(type, "currentThread", "()Ljava/lang/Thread;");
-    jmethodID const getName = env->GetMethodID(type, "getName", "()Ljava/lang/String;");
     jobject const thread = env->CallStaticObjectMethod(type, current);
-    if (env->ExceptionCheck()) return {};
-    auto const name = static_cast<jstring>(env->CallObjectMethod(thread, getName));
-    if (env->ExceptionCheck()) return {};
+    auto const name = static_cast<jstring>(
+        env->GetObjectField(thread, env->GetFieldID(type, "name", "Ljava/lang/String;")));
     char text[64] = {};
     env->GetStringUTFRegion(name, 0, env->GetStringLength(name), text);
     return text;

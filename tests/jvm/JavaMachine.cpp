@@ -26,24 +26,15 @@ jint JNICALL Collect(FILE*, char const* format, va_list arguments) {
     return length;
 }
 
-template <class Function>
-void* Address(Function* function) {
-    return reinterpret_cast<void*>(function);
-}
-
 class MachineEnvironment : public testing::Environment {
 public:
     void SetUp() override {
-        char classPath[] = "-Djava.class.path=" MOKA_JVM_TEST_CLASSES;
-        char checks[] = "-Xcheck:jni";
-        char heap[] = "-Xmx64m";
-        char collector[] = "-XX:+UseSerialGC";
-        char hook[] = "vfprintf";
-        JavaVMOption options[] = {{classPath, nullptr},
-                                  {checks, nullptr},
-                                  {heap, nullptr},
-                                  {collector, nullptr},
-                                  {hook, Address(&Collect)}};
+        auto const option = [](char const* text, void* extra = nullptr) {
+            return JavaVMOption{const_cast<char*>(text), extra};
+        };
+        JavaVMOption options[] = {option("-Djava.class.path=" MOKA_JVM_TEST_CLASSES), option("-Xcheck:jni"),
+                                  option("-Xmx64m"), option("-XX:+UseSerialGC"),
+                                  option("vfprintf", reinterpret_cast<void*>(&Collect))};
         JavaVMInitArgs arguments = {};
         arguments.version = JNI_VERSION_1_8;
         arguments.options = options;

@@ -51,26 +51,24 @@ TEST_F(JniBitmapTest, PixelsComeOverBitForBitAndRowsLoseTheirPadding) {
         ASSERT_TRUE(JNI_ConvertJavaToBitmap(mEnv, javaBitmap, &bitmap, false));
         EXPECT_EQ(ArrayMemory::GetLive(), before + static_cast<std::size_t>(rowBytes) * 16);
         EXPECT_EQ(GetRecycled(javaBitmap), 0);
-        EXPECT_EQ(bitmap.GetWidth(), 16);
-        EXPECT_EQ(bitmap.GetHeight(), 16);
-        EXPECT_EQ(bitmap.GetStride(), 64);
-        EXPECT_EQ(bitmap.GetFormat(), Bitmap::kFormatRgba8888);
+        EXPECT_EQ(
+            std::vector({bitmap.GetWidth(), bitmap.GetHeight(), bitmap.GetStride(), bitmap.GetFormat()}),
+            std::vector({16, 16, 64, int{Bitmap::kFormatRgba8888}}));
         EXPECT_EQ(Bytes(bitmap.GetBuffer(), bitmap.GetBuffer() + expected.size()), expected) << rowBytes;
     }
 }
 
 TEST_F(JniBitmapTest, RecyclesOnRequestAndKeepsThePixelsWhateverComesOfIt) {
-    for (bool const fails : {false, true}) {
-        JavaPicture source;
-        source.failing = fails ? "recycle" : "";
-        jobject const javaBitmap = MakeJavaBitmap(source);
+    for (int const isWell : {0, 1}) {
+        jobject const javaBitmap =
+            MakeJavaBitmap({1, 1, 4, "ARGB_8888", {1, 2, 3, 4}, isWell ? "" : "recycle"});
         Bitmap bitmap;
         LogCapture log;
         EXPECT_TRUE(JNI_ConvertJavaToBitmap(mEnv, javaBitmap, &bitmap, true));
         EXPECT_NE(bitmap.GetBuffer(), nullptr);
-        EXPECT_EQ(GetRecycled(javaBitmap), fails ? 0 : 1);
-        EXPECT_EQ(log.Count(ANDROID_LOG_ERROR, "recycle: java.lang.IllegalStateException"), fails ? 1 : 0);
-        EXPECT_EQ(log.GetLines().size(), fails ? 1u : 0u);
+        EXPECT_EQ(GetRecycled(javaBitmap), isWell);
+        EXPECT_EQ(log.Count(ANDROID_LOG_ERROR, "recycle: java.lang.IllegalStateException"), 1 - isWell);
+        EXPECT_EQ(log.GetTexts().size(), 1u - static_cast<unsigned>(isWell));
     }
 }
 

@@ -9,48 +9,34 @@ namespace Moka::Testing {
 
 class PatchedFunctions {
 public:
-    explicit PatchedFunctions(JNIEnv* env) : mEnv(env), mOriginal(env->functions), mPatched(*env->functions) {
+    // A lookup by the missing name finds nothing, however the class path looks.
+    explicit PatchedFunctions(JNIEnv* env, char const* missing = "") : mEnv(env), mPatched(*env->functions) {
+        sMissing = missing;
+        sOriginal = env->functions;
         env->functions = &mPatched;
+        mPatched.FindClass = [](JNIEnv* e, char const* type) { return sOriginal->FindClass(e, Hide(type)); };
+        mPatched.GetStaticMethodID = [](JNIEnv* e, jclass type, char const* method, char const* signature) {
+            return sOriginal->GetStaticMethodID(e, type, Hide(method), signature);
+        };
+        mPatched.GetMethodID = [](JNIEnv* e, jclass type, char const* method, char const* signature) {
+            return sOriginal->GetMethodID(e, type, Hide(method), signature);
+        };
     }
-    ~PatchedFunctions() { mEnv->functions = mOriginal; }
+    ~PatchedFunctions() { mEnv->functions = sOriginal; }
     PatchedFunctions(PatchedFunctions const&) = delete;
     PatchedFunctions& operator=(PatchedFunctions const&) = delete;
 
     JNINativeInterface_* operator->() { return &mPatched; }
-    JNINativeInterface_ const& GetOriginal() const { return *mOriginal; }
-
-private:
-    JNIEnv* const mEnv;
-    JNINativeInterface_ const* const mOriginal;
-    JNINativeInterface_ mPatched;
-};
-
-// For a scope, a lookup by this name finds nothing, however the class path looks.
-class MissingName {
-public:
-    MissingName(JNIEnv* env, char const* name) : mFunctions(env) {
-        sMissing = name;
-        sOriginal = &mFunctions.GetOriginal();
-        mFunctions->FindClass = [](JNIEnv* e, char const* type) {
-            return sOriginal->FindClass(e, Hide(type));
-        };
-        mFunctions->GetStaticMethodID = [](JNIEnv* e, jclass type, char const* method,
-                                           char const* signature) {
-            return sOriginal->GetStaticMethodID(e, type, Hide(method), signature);
-        };
-        mFunctions->GetMethodID = [](JNIEnv* e, jclass type, char const* method, char const* signature) {
-            return sOriginal->GetMethodID(e, type, Hide(method), signature);
-        };
-    }
-    JNINativeInterface_* operator->() { return mFunctions.operator->(); }
-    JNINativeInterface_ const& GetOriginal() const { return mFunctions.GetOriginal(); }
+    // The VM's, of the scope that was entered last.
+    static JNINativeInterface_ const& GetOriginal() { return *sOriginal; }
 
 private:
     static char const* Hide(char const* name) { return sMissing == name ? "isNotThere" : name; }
 
     static inline std::string sMissing;
     static inline JNINativeInterface_ const* sOriginal;
-    PatchedFunctions mFunctions;
+    JNIEnv* const mEnv;
+    JNINativeInterface_ mPatched;
 };
 
 } // namespace Moka::Testing

@@ -21,12 +21,11 @@ using testing::ElementsAre;
 
 std::vector<JNINativeMethod> registered;
 jint registration;
-JNINativeInterface_ const* original;
 
 // The VM's own classes come by as well: looking ours up may be the first use of them.
 jint JNICALL RegisterNatives(JNIEnv* env, jclass type, JNINativeMethod const* methods, jint count) {
     if (std::strncmp(methods->name, "Native_", 7) != 0)
-        return original->RegisterNatives(env, type, methods, count);
+        return PatchedFunctions::GetOriginal().RegisterNatives(env, type, methods, count);
     registered.assign(methods, methods + count);
     return registration;
 }
@@ -35,7 +34,6 @@ jint JNICALL RegisterNatives(JNIEnv* env, jclass type, JNINativeMethod const* me
 std::vector<std::string> LoadDisplay(jint result) {
     PatchedFunctions functions(JavaMachine::GetMainEnv());
     functions->RegisterNatives = &RegisterNatives;
-    original = &functions.GetOriginal();
     registration = result;
     LogCapture log;
     Display_OnLoad(JavaMachine::GetVm());
@@ -113,9 +111,8 @@ TEST(Registration, AClassThatIsMissingIsTheExceptionOfTheLoading) {
     for (auto const& [name, line] : cases) {
         LogCapture const log;
         {
-            MissingName missing(env, name);
+            PatchedFunctions missing(env, name);
             missing->RegisterNatives = &RegisterNatives;
-            original = &missing.GetOriginal();
             registration = -1; // or the loader's thread would be started
             JNI_OnLoad(JavaMachine::GetVm(), nullptr);
         }

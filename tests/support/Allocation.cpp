@@ -11,7 +11,6 @@ namespace Moka::Testing {
 namespace {
 
 thread_local int allocations = 0;
-thread_local int pauses = 0;
 std::atomic<std::size_t> liveBytes{0};
 std::atomic<std::size_t> peakBytes{0};
 std::atomic<bool> mayLeak{false};
@@ -42,8 +41,8 @@ void CountArray(std::size_t size) {
 
 void* Allocate(std::size_t size, bool isArray, bool throws) {
     ++allocations;
-    bool const fails = FailAllocations::sAll > 0 || (isArray && !throws && NoArrayMemory::sArrays > 0) ||
-                       (throws ? pauses == 0 && Faults::Fails(Faults::Kind::Throwing)
+    bool const fails = FailAllocations::sCount > 0 || (isArray && !throws && NoArrayMemory::sCount > 0) ||
+                       (throws ? Faults::Pause::sCount == 0 && Faults::Fails(Faults::Kind::Throwing)
                                : Faults::Fails(Faults::Kind::Objects));
     void* const memory = fails ? nullptr : std::malloc(sizeof(Header) + size);
     if (!memory && throws) throw std::bad_alloc();
@@ -63,9 +62,6 @@ void Free(void* memory) noexcept {
 }
 
 } // namespace
-
-thread_local int FailAllocations::sAll = 0;
-thread_local int NoArrayMemory::sArrays = 0;
 
 void Faults::Arm(Kind kind, int k, bool all) {
     KindOfAllocation& armed = Get(kind);
@@ -88,9 +84,6 @@ bool Faults::Fails(Kind kind) {
     int const ordinal = ++armed.count;
     return armed.first > 0 && (ordinal == armed.first || (armed.all && ordinal > armed.first));
 }
-
-Faults::Pause::Pause() { ++pauses; }
-Faults::Pause::~Pause() { --pauses; }
 
 std::int64_t Faults::CountLive(Kind kind) { return Get(kind).live; }
 void Faults::AddLive(Kind kind, int count) { Get(kind).live += count; }

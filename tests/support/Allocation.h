@@ -7,27 +7,22 @@
 
 namespace Moka::Testing {
 
+// How many of a kind of scope the thread is in.
+template <class Kind>
+class CountedScope {
+public:
+    CountedScope() { ++sCount; }
+    ~CountedScope() { --sCount; }
+    CountedScope(CountedScope const&) = delete;
+    CountedScope& operator=(CountedScope const&) = delete;
+
+    static inline thread_local int sCount = 0;
+};
+
 // Which of the thread's allocations fail while one exists: all, or array new that does not throw. Collect results
 // in the scope and assert after it, since assertions allocate.
-class FailAllocations {
-public:
-    FailAllocations() { ++sAll; }
-    ~FailAllocations() { --sAll; }
-    FailAllocations(FailAllocations const&) = delete;
-    FailAllocations& operator=(FailAllocations const&) = delete;
-
-    static thread_local int sAll;
-};
-
-class NoArrayMemory {
-public:
-    NoArrayMemory() { ++sArrays; }
-    ~NoArrayMemory() { --sArrays; }
-    NoArrayMemory(NoArrayMemory const&) = delete;
-    NoArrayMemory& operator=(NoArrayMemory const&) = delete;
-
-    static thread_local int sArrays;
-};
+struct FailAllocations : CountedScope<FailAllocations> {};
+struct NoArrayMemory : CountedScope<NoArrayMemory> {};
 
 // Makes the k-th allocation of a kind in the process fail, and knows how many are still alive. Which one is the k-th
 // is only certain while one thread allocates.
@@ -46,13 +41,7 @@ public:
     static bool Fails(Kind kind);
 
     // While one lives, those of its thread's allocations that throw neither fail nor count.
-    class Pause {
-    public:
-        Pause();
-        ~Pause();
-        Pause(Pause const&) = delete;
-        Pause& operator=(Pause const&) = delete;
-    };
+    struct Pause : CountedScope<Pause> {};
 
     // Not yet freed.
     static std::int64_t CountLive(Kind kind);

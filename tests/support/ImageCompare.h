@@ -39,7 +39,6 @@ private:
 struct ImageDifference {
     int differingPixels = 0; // by more than they may
     int largest = 0;         // of any channel of these
-    double mean = 0;         // of these, over all channels of all pixels
     int firstX = -1;         // of the first differing pixel in reading order; -1 when there is none
     int firstY = -1;
 };

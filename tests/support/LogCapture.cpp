@@ -15,14 +15,8 @@ LogCapture::~LogCapture() { SetLogSink(std::move(mPrevious)); }
 std::vector<std::string> LogCapture::GetTexts(int priority) const {
     std::vector<std::string> texts;
     for (LogLine const& line : GetLines()) {
-        if (line.priority == priority) texts.push_back(line.text);
+        if (priority == kAll || line.priority == priority) texts.push_back(line.text);
     }
-    return texts;
-}
-
-std::vector<std::string> LogCapture::GetTexts() const {
-    std::vector<std::string> texts;
-    for (LogLine const& line : GetLines()) texts.push_back(line.text);
     return texts;
 }
 

@@ -20,8 +20,7 @@ public:
 
     std::vector<LogLine> GetLines() const { return mLines.Get(); }
     // The texts of one priority, or of all; for comparing with what is expected.
-    std::vector<std::string> GetTexts(int priority) const;
-    std::vector<std::string> GetTexts() const;
+    std::vector<std::string> GetTexts(int priority = kAll) const;
 
     // The lines of a priority whose text contains part.
     int Count(int priority, std::string const& part = {}) const;
@@ -41,6 +40,8 @@ public:
     void Clear() { mLines.Set({}); }
 
 private:
+    static constexpr int kAll = -1;
+
     Awaited<std::vector<LogLine>> mLines;
     LogSink mPrevious;
 };

@@ -33,15 +33,12 @@ HandPumpedQueue::~HandPumpedQueue() = default;
 
 bool HandPumpedQueue::Post(ITask* task) {
     std::lock_guard<std::mutex> lock(mMutex);
-    mNull += task ? 0 : 1;
     if (!task) return true;
-    bool const isAccepted = Accepts(++mOffered, task);
-    mRefused += isAccepted ? 0 : 1;
-    if (isAccepted) mTasks.emplace_back(task);
-    return isAccepted;
+    bool const isRefused = mRefuses(++mOffered, task);
+    mRefused += isRefused ? 1 : 0;
+    if (!isRefused) mTasks.emplace_back(task);
+    return !isRefused;
 }
-
-bool HandPumpedQueue::Accepts(int, ITask*) { return true; }
 
 void HandPumpedQueue::WaitForTasks() {
     if (tRunning == this) return;

@@ -17,12 +17,17 @@ namespace Moka::Testing {
 // Fails:  an exception out of a task reaches the caller of Run...; the task is freed and counts as run.
 class HandPumpedQueue : public IGLMsgQueue {
 public:
-    HandPumpedQueue() = default;
+    // Whether a task is refused; ordinal counts the tasks offered, from 1. Asked under the queue's lock: it must not
+    // use the queue.
+    using Predicate = std::function<bool(int ordinal, ITask* task)>;
+
+    explicit HandPumpedQueue(Predicate refuses = [](int, ITask*) { return false; })
+        : mRefuses(std::move(refuses)) {}
     ~HandPumpedQueue() override;
     HandPumpedQueue(HandPumpedQueue const&) = delete;
     HandPumpedQueue& operator=(HandPumpedQueue const&) = delete;
 
-    // Always true. A null task is counted and forgotten.
+    // A null task is accepted and forgotten.
     bool Post(ITask* task) override;
 
     // Runs everything on the calling thread, which stands for both sides. Called from inside a task, it is
@@ -41,22 +46,15 @@ public:
     int GetPostedCount() const {
         return Read([this] { return mOffered - mRefused; });
     } // accepted tasks
-    int GetNullCount() const {
-        return Read([this] { return mNull; });
-    }
     int GetRunCount() const {
         return Read([this] { return mRun; });
     }
     int GetRefusedCount() const {
         return Read([this] { return mRefused; });
-    } // by a derived queue
+    }
     int GetWaitCount() const {
         return Read([this] { return mWaits; });
     }
-
-protected:
-    // Whether a task is accepted; ordinal counts the tasks offered, from 1. Called under the lock.
-    virtual bool Accepts(int ordinal, ITask* task);
 
 private:
     template <class Value>
@@ -66,10 +64,10 @@ private:
     }
     std::unique_ptr<ITask> TakeFirst();
 
+    Predicate const mRefuses;
     std::mutex mutable mMutex;
     std::deque<std::unique_ptr<ITask>> mTasks;
     int mOffered = 0;
-    int mNull = 0;
     int mRun = 0;
     int mRefused = 0;
     int mWaits = 0;
@@ -77,20 +75,10 @@ private:
     std::function<void()> mAfterRun;
 };
 
-// RefusingQueue: refuses every task, or those that a test chooses; the others it stores like its base.
-class RefusingQueue final : public HandPumpedQueue {
-public:
-    using Predicate = std::function<bool(int ordinal, ITask* task)>;
-
-    // Refuses where the predicate says so. It is called under the queue's lock and must not use the queue.
+// RefusingQueue: refuses every task, or those that a test chooses.
+struct RefusingQueue final : HandPumpedQueue {
     explicit RefusingQueue(Predicate refuses = [](int, ITask*) { return true; })
-        : mRefuses(std::move(refuses)) {}
-
-protected:
-    bool Accepts(int ordinal, ITask* task) override { return !mRefuses(ordinal, task); }
-
-private:
-    Predicate mRefuses;
+        : HandPumpedQueue(std::move(refuses)) {}
 };
 
 } // namespace Moka::Testing

@@ -58,7 +58,6 @@ TEST(ImageCompareTest, ReportsHowManyHowFarAndWhereButWhatMayDiffer) {
     ImageDifference const difference = CompareImages(changed, image);
     EXPECT_EQ(difference.differingPixels, 2);
     EXPECT_EQ(difference.largest, 100);
-    EXPECT_DOUBLE_EQ(difference.mean, 103.0 / 400);
     EXPECT_EQ(difference.firstY, 4);
     EXPECT_EQ(CompareImages(image, MakeGradient(10, 9)).differingPixels, 100);
     Slack slack(10, 10);

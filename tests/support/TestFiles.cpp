@@ -5,10 +5,12 @@
 #include "moka/base/String.h"
 
 #include <algorithm>
+#include <chrono>
 #include <cstdlib>
 #include <fstream>
 #include <iterator>
 #include <memory>
+#include <thread>
 
 namespace Moka::Testing {
 
@@ -19,12 +21,19 @@ TempFolder::TempFolder() {
 
 TempFolder::~TempFolder() { std::filesystem::remove_all(mPath); }
 
-std::vector<std::string> TempFolder::List() const {
+std::vector<std::string> TempFolder::List(std::string const& folder) const {
     std::vector<std::string> names;
-    for (auto const& entry : std::filesystem::directory_iterator(mPath))
+    for (auto const& entry : std::filesystem::directory_iterator(mPath / folder))
         names.push_back(entry.path().filename().string());
     std::sort(names.begin(), names.end());
     return names;
+}
+
+bool Soon(std::function<bool()> const& holds) {
+    bool isSo = holds();
+    for (int i = 0; i < 30000 && !isSo; ++i, isSo = holds())
+        std::this_thread::sleep_for(std::chrono::milliseconds(1));
+    return isSo;
 }
 
 std::string ReadFile(std::string const& path) {

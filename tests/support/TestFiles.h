@@ -4,6 +4,7 @@
 #include "tests/support/TestImages.h"
 
 #include <filesystem>
+#include <functional>
 #include <string>
 #include <vector>
 
@@ -19,11 +20,15 @@ public:
 
     std::filesystem::path const& GetPath() const { return mPath; }
     std::string Path(std::string const& name) const { return (mPath / name).string(); }
-    std::vector<std::string> List() const; // sorted
+    // Sorted; everything, hidden files as well.
+    std::vector<std::string> List(std::string const& folder = ".") const;
 
 private:
     std::filesystem::path mPath;
 };
+
+// Whether the condition holds within half a minute: the sanitizers and a cold disk take their time.
+bool Soon(std::function<bool()> const& holds);
 
 std::string ReadFile(std::string const& path);
 void WriteFile(std::string const& path, std::string const& content);

@@ -18,8 +18,4 @@ Picture MakeAlphaPattern(int width, int height);
 // Squares of cell pixels, first where the one at the origin is.
 Picture MakeChecker(int width, int height, int cell, Color const& first, Color const& second);
 
-// A page of handwriting as the platform saves it: transparent, with dark, soft-edged strokes on lines. For
-// codecs and measurements, where a synthetic pattern would flatter or hurt.
-Picture MakeInkPage(int width, int height);
-
 } // namespace Moka::Testing

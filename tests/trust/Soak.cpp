@@ -56,18 +56,6 @@ double GetResidentBytes() {
     return kilobytes * 1024;
 }
 
-std::unique_ptr<IGLMsgQueue> StartRenderThread() {
-    RenderThreadOptions options;
-    options.limits.maxTextureSize = kMaxTexture;
-    options.debugContext = true;
-    options.surfaceWidth = kMaxTexture; // the screen bitmaps need a default frame buffer
-    options.surfaceHeight = kMaxTexture;
-    std::string error;
-    auto thread = RenderThread::Start(options, &error);
-    if (!thread) std::fprintf(stderr, "no render thread: %s\n", error.c_str());
-    return thread;
-}
-
 // What the driver reported counts too: none of it may come.
 int CountRendererObjects() {
     RendererStatistics const s = RendererFactory::GetStatistics();
@@ -76,23 +64,21 @@ int CountRendererObjects() {
            s.stateObjects + s.buffers + static_cast<int>(s.errors);
 }
 
-// What a task drops for good is deleted by a task that it posts, which may drop more.
-void AwaitIdle(IGLMsgQueue& queue) {
-    constexpr int kDeepest = 8;
-    for (int i = 0; i < kDeepest; ++i) queue.WaitForTasks();
-}
-
 // Counts what is posted.
 class CountingQueue final : public IGLMsgQueue {
 public:
     explicit CountingQueue(IGLMsgQueue& queue) : mQueue(queue) {}
-    ~CountingQueue() override { AwaitIdle(mQueue); }
+    ~CountingQueue() override { AwaitIdle(); }
 
     bool Post(ITask* task) override {
         ++posted;
         return mQueue.Post(task);
     }
     void WaitForTasks() override { mQueue.WaitForTasks(); }
+    // What a task drops for good is deleted by a task that it posts, which may drop more.
+    void AwaitIdle() {
+        for (int depth = 0; depth < 8; ++depth) WaitForTasks();
+    }
 
     std::atomic<std::int64_t> posted{0};
 
@@ -119,35 +105,32 @@ public:
     explicit ProgramsInUse(IGLMsgQueue& queue)
         : mTarget(NewBitmap(queue, kMaxTexture, kMaxTexture)),
           mCanvas(NewCanvas(queue, mTarget)),
-          mDrawables{Made::Adopt(new MKGaussianBlurDrawable(&queue)),
-                     Made::Adopt(new MKTextMaskBitmapDrawable(&queue)),
-                     Made::Adopt(new MKStrokeDrawable(&queue)),
-                     Made::Adopt(new MKNonPremultipliedColorDrawable(&queue)),
-                     Made::Adopt(new MKBlendedBitmapDrawable(&queue, nullptr, nullptr, {}, {}, 0, 0))} {
+          mDrawables{Adopt(new MKGaussianBlurDrawable(&queue)), Adopt(new MKTextMaskBitmapDrawable(&queue)),
+                     Adopt(new MKStrokeDrawable(&queue)), Adopt(new MKNonPremultipliedColorDrawable(&queue)),
+                     Adopt(new MKBlendedBitmapDrawable(&queue, nullptr, nullptr, {}, {}, 0, 0))} {
         Scenes::QueueStage stage(queue);
         for (Scenes::Scene const& scene : Scenes::GetScenes())
             if (!scene.needsPen) DrawScene(scene, *mCanvas, stage);
     }
 
 private:
-    using Made = RefPtr<IMKCustomDrawable>;
+    static constexpr auto Adopt = RefPtr<IMKCustomDrawable>::Adopt;
 
     RefPtr<IMKBitmap> const mTarget;
     RefPtr<IMKCanvas> const mCanvas;
-    std::vector<Made> const mDrawables;
+    std::vector<RefPtr<IMKCustomDrawable>> const mDrawables;
 };
-
-// The renderer may keep a copy of a target for the next time, or not.
-int GetMostObjects(std::vector<Sample> const& samples, std::size_t count) {
-    int most = 0;
-    for (std::size_t i = 0; i < count; ++i) most = std::max(most, samples[i].objects);
-    return most;
-}
 
 int Soak(std::int64_t operations) {
     mallopt(M_ARENA_MAX, 1); // so that the heap's count has every thread's blocks
     SetLogSink([](LogLine const&) {});
-    std::unique_ptr<IGLMsgQueue> const thread = StartRenderThread();
+    RenderThreadOptions options;
+    options.limits.maxTextureSize = kMaxTexture;
+    options.debugContext = true;
+    options.surfaceWidth = options.surfaceHeight = kMaxTexture; // screen bitmaps need a default frame buffer
+    std::string error;
+    auto const thread = RenderThread::Start(options, &error);
+    if (!thread) std::fprintf(stderr, "no render thread: %s\n", error.c_str());
     TempFolder const folder;
     if (!thread || !SaveImage(MakeGradient(20, 90), folder.Path("picture.png"))) return 1;
     MKBitmapFactory_UseNativeDecoder();
@@ -159,13 +142,15 @@ int Soak(std::int64_t operations) {
     samples.reserve(kSamples);
     for (std::int64_t i = 1; i <= kSamples; ++i) {
         while (queue.posted < operations * i / kSamples) RunAnyScenario(stage, random);
-        AwaitIdle(queue);
+        queue.AwaitIdle();
         samples.push_back({static_cast<double>(queue.posted), GetResidentBytes(),
                            static_cast<double>(mallinfo2().uordblks), CountRendererObjects()});
     }
     double const slope = GetSlope(samples, &Sample::bytes) * 10000;
     double const heapSlope = GetSlope(samples, &Sample::inUse) * 10000;
-    int const objects = GetMostObjects(samples, kWarmUp);
+    // The renderer may keep a copy of a target for the next time, or not.
+    int objects = 0;
+    for (std::size_t i = 0; i < kWarmUp; ++i) objects = std::max(objects, samples[i].objects);
     std::printf("operations %lld\nresident %.0f KB after warm-up, %.0f KB at the end\n"
                 "growth for 10,000 operations: resident %.1f bytes, heap in use %.1f bytes\n"
                 "renderer objects at most %d in the warm-up, %d at the end\n",

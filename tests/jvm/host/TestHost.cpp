@@ -7,8 +7,8 @@
 #include <jni.h>
 #include <memory>
 #include <mutex>
+#include <string>
 #include <utility>
-#include <vector>
 
 namespace {
 
@@ -17,7 +17,7 @@ using namespace Moka;
 JavaVM* javaVm = nullptr;
 
 std::mutex logMutex;
-std::vector<std::string> logTexts;
+std::string logText;
 
 String ToString(JNIEnv* env, jstring text) {
     std::u16string units(static_cast<std::size_t>(env->GetStringLength(text)), u'\0');
@@ -45,25 +45,14 @@ JNIEXPORT jint JNICALL JNI_OnLoad(JavaVM* vm, void*) {
     javaVm = vm;
     SetLogSink([](LogLine const& line) {
         std::lock_guard<std::mutex> lock(logMutex);
-        logTexts.push_back(line.text);
+        logText += line.text + '\n';
     });
     return JNI_VERSION_1_6;
 }
 
-JNIEXPORT jobjectArray JNICALL Java_moka_Host_takeLog(JNIEnv* env, jclass) {
-    std::vector<std::string> texts;
-    {
-        std::lock_guard<std::mutex> lock(logMutex);
-        texts = std::exchange(logTexts, {});
-    }
-    jobjectArray const array =
-        env->NewObjectArray(static_cast<jsize>(texts.size()), env->FindClass("java/lang/String"), nullptr);
-    for (std::size_t i = 0; i < texts.size(); ++i) {
-        jstring const text = env->NewStringUTF(texts[i].c_str());
-        env->SetObjectArrayElement(array, static_cast<jsize>(i), text);
-        env->DeleteLocalRef(text);
-    }
-    return array;
+JNIEXPORT jstring JNICALL Java_moka_Host_takeLog(JNIEnv* env, jclass) {
+    std::lock_guard<std::mutex> lock(logMutex);
+    return env->NewStringUTF(std::exchange(logText, {}).c_str());
 }
 
 JNIEXPORT jint JNICALL Java_moka_Host_loadBridge(JNIEnv* env, jclass) {
