@@ -13,9 +13,9 @@ struct __attribute__((packed, may_alias)) AnyWord {
     std::uint64_t bits;
 };
 
-/// This is one expression because compilers vectorise a loop to 16-byte loads. If two separate 8-byte stores
-/// wrote these bytes just before, the load stalls until both have left the store buffer (no store
-/// forwarding).
+/// Returns true if the words of a and b are equal. It is one expression because compilers
+/// vectorise a loop to 16-byte loads. If two separate 8-byte stores wrote these bytes just before, such a load
+/// stalls until both have left the store buffer (no store forwarding).
 template <std::size_t... kIndices>
 bool HasSameWords(AnyWord const* a, AnyWord const* b, std::index_sequence<kIndices...>) {
     return ((a[kIndices].bits ^ b[kIndices].bits) | ...) == 0;

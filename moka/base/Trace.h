@@ -9,9 +9,8 @@
 /// Text:    every `char const*` must stay valid until the trace has stopped, as string literals do.
 /// Fails:   Start returns false and the reason if the file cannot be opened. If writing fails later, it logs
 ///          a warning, truncates the file after the last event that fits, and stops tracing.
-/// Lost:    scopes that are still open at Stop() or at the exit of the process, and the last tasks of one
-/// kind of
-///          a queue that still runs. All earlier events are in the file.
+/// Lost:    scopes that are still open at Stop() or at the exit of the process, and the last tasks, all of one
+///          kind, of a queue that still runs. All earlier events are in the file.
 #pragma once
 
 #include "moka/base/Export.h"

@@ -24,7 +24,7 @@ struct StrokeCell {
     float x; // of the upper left corner
     float y;
     float side;                // 0: not in use
-    float segments;            // bit i: the points i and i + 1 are joined
+    float segments;            // bit i: a segment joins the points i and i + 1
     float points[3 * kPoints]; // x and y relative to the corner, and the radius
 };
 
@@ -32,14 +32,13 @@ class StrokeCells {
 public:
     explicit StrokeCells(StrokeScale const& scale) : mScale(scale) {}
 
-    // Adds a segment; the first one has number 0. TakeBackLast removes the last one if mayBeTakenBack was
-    // true.
+    // Adds a segment. TakeBackLast removes the last segment; its mayBeTakenBack must have been true.
     void Add(StrokeSegment const& segment, bool mayBeTakenBack);
     void TakeBackLast();
     // Removes all segments and keeps their memory.
     void Clear();
 
-    // Updates and returns the cells.
+    // Updates the cells of changed leaves, and returns all cells. Those with side 0 are not in use.
     std::vector<StrokeCell> const& Make();
 
 private:

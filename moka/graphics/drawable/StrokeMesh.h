@@ -1,6 +1,6 @@
-// StrokeMesh: the cells of a stroke at one scale. It drops points that lie between others to a fraction of a
-// device pixel. The segment from the last kept point to the end of the stroke is provisional, because later
-// points may extend it.
+// StrokeMesh: the cells of a stroke at one scale. It drops points that lie on the line between their
+// neighbours, within a fraction of a device pixel. The segment from the last kept point to the end of the
+// stroke is provisional, because later points may extend it.
 // Thread: render thread.
 // Fails:  throws bad_alloc; the mesh must then be discarded.
 // Cost:   constant for each new point.
@@ -23,11 +23,11 @@ public:
 
     StrokeScale const& GetScale() const { return mScale; }
 
-    // Adds the points that are new since the last call; earlier ones must not change. There must be at least
-    // one point.
+    // Adds the points that are new since the last call, and returns all cells. Earlier points must not change.
+    // There must be at least one point.
     std::vector<StrokeCell> const& Update(std::vector<MKStrokePoint> const& points);
 
-    // As at the start; keeps the memory.
+    // Removes all points and keeps the memory.
     void Clear();
 
 private:

@@ -10,6 +10,7 @@
 
 namespace Moka::detail {
 
+// Copies 4 bytes to kept. Returns true if they differed.
 inline bool ReplaceWord(unsigned char* kept, void const* value) {
     std::uint32_t before;
     std::uint32_t now;
