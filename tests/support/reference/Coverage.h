@@ -2,12 +2,10 @@
 // edges and ramps one unit wide across them, in the units the shape is given in.
 #pragma once
 
-#include "moka/base/Rect.h"
 #include "moka/graphics/canvas/MKPaint.h"
 #include "tests/support/reference/Plane.h"
 
 #include <functional>
-#include <optional>
 #include <vector>
 
 namespace Moka::Testing {

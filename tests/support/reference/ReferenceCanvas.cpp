@@ -1,7 +1,6 @@
 // The canvas's state, and its shapes; ReferenceCanvasBitmaps.cpp draws the bitmaps.
 #include "tests/support/reference/ReferenceCanvas.h"
 
-#include <algorithm>
 #include <cmath>
 
 namespace Moka::Testing {

@@ -1,6 +1,5 @@
 #include "tests/support/reference/ReferenceCanvas.h"
 
-#include <algorithm>
 #include <cmath>
 
 namespace Moka::Testing {
@@ -141,8 +140,7 @@ void ReferenceCanvas::DrawQuads(Picture const& image, ReferenceBitmap const& bit
     }
     ClipSet const clip = GetClip();
     // A batch draws where there is no stencil.
-    bool const unclipped = batch && clip.IsPointSet();
-    mRaster.Draw(painting, unclipped ? ClipSet({}, mTarget.image.height) : clip);
+    mRaster.Draw(painting, batch && clip.IsPointSet() ? ClipSet() : clip);
 }
 
 void ReferenceCanvas::DrawBitmaps(IMKBitmap* bitmap, std::vector<PointF>& points, MKPaint const* paint) {
