@@ -100,13 +100,7 @@ constexpr int kTargetSize = kColumns * kCell;
 
 class MergedProgramsTest : public RendererFixture {
 protected:
-    void TearDown() override {
-        End();
-        RendererFixture::TearDown();
-    }
-
     void Begin(bool merges) {
-        End();
         RendererFactory::DetachContext();
         RendererLimits limits;
         limits.mergesDraws = merges;
@@ -119,13 +113,6 @@ protected:
         layout.addAttribute(VertexAttributeType::Float, 2, -1, 0);
         layout.addAttribute(VertexAttributeType::Float, 2, -1, 0);
         quad.reset(RendererFactory::CreateGraphicsObject(1, PrimitiveType::TriangleList, &layout, 0, 0));
-    }
-    void End() {
-        program.reset();
-        quad.reset();
-        texel.reset();
-        mask.reset();
-        image = {};
     }
     void MakeProgram(Texts const& texts) {
         program.reset(RendererFactory::CreateShaderProgram(texts.vertex, texts.fragment, "foreign"));

@@ -40,15 +40,7 @@ GLuint MakeCurrent(ProgramPtr const& program) {
 
 class ProgramTest : public RendererFixture {
 protected:
-    void SetUp() override {
-        RendererFixture::SetUp();
-        mImage = MakeOffscreen(MakeImage(2, 2));
-        mImage.target->Activate();
-    }
-    void TearDown() override {
-        mImage = {};
-        RendererFixture::TearDown();
-    }
+    ProgramTest() { mImage.target->Activate(); }
 
     // What the current program draws over the whole target.
     Color Draw() {
@@ -61,7 +53,7 @@ protected:
         return image.GetColor(0, 0);
     }
 
-    OffscreenImage mImage;
+    OffscreenImage mImage = MakeOffscreen(MakeImage(2, 2));
 };
 
 TEST_F(ProgramTest, AttributesTakeTheirLocationsInTheOrderOfTheText) {

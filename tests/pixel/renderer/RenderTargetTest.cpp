@@ -125,8 +125,7 @@ TEST_F(RenderTargetTest, ADriverErrorIsLoggedCountedAndHarmless) {
 }
 
 TEST_F(RenderTargetTest, ATargetWithoutAlphaIsCopiedWithAlphaOne) {
-    HostFrameBuffer const host(5, 4, GL_RGB8);
-    host.Fill(Color{10, 20, 30, 40});
+    HostFrameBuffer const host(5, 4, GL_RGB8, Color{10, 20, 30, 40});
     TargetPtr const target(RendererFactory::CreateRenderTargetFromCurrent(5, 4));
     glEnable(GL_SCISSOR_TEST);
     glScissor(0, 0, 1, 1);
