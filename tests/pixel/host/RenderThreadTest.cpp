@@ -18,11 +18,8 @@
 #include "scenes/SceneRenderer.h"
 #include "tests/support/ImageCompare.h"
 #include <array>
-#include <gtest/gtest.h>
 #include <stdexcept>
-#include <string>
 #include <thread>
-#include <vector>
 
 namespace Moka::Testing {
 namespace {
