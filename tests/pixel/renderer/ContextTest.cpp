@@ -85,7 +85,7 @@ TEST_F(ContextTest, ObjectsThatOutliveTheirContextAreInertInTheNextOne) {
 
     EXPECT_EQ(Read(*stranger), MakeImage(4, 4, kGreen));
     EXPECT_EQ(Read(*another), MakeImage(4, 4, kGreen));
-    EXPECT_EQ(RendererFactory::GetStatistics().textures, 2);
+    EXPECT_EQ(Count().textures, 2);
 }
 
 #if defined(MOKA_CHECKS) && MOKA_CHECKS

@@ -38,6 +38,13 @@ struct Brush {
     ParameterPtr parameter;
 };
 
+// Of triangles with so many attributes of two floats.
+inline GraphicsPtr MakeGraphics(int attributes) {
+    VertexDescriptor layout;
+    for (int i = 0; i < attributes; ++i) layout.addAttribute(VertexAttributeType::Float, 2, -1, 0);
+    return GraphicsPtr(RendererFactory::CreateGraphicsObject(1, PrimitiveType::TriangleList, &layout, 0, 0));
+}
+
 class DrawFixture : public RendererFixture, public ::testing::WithParamInterface<bool> {
 protected:
     DrawFixture() {
@@ -46,12 +53,6 @@ protected:
         stencil->Apply();
     }
 
-    static GraphicsPtr MakeQuad() {
-        VertexDescriptor layout;
-        layout.addAttribute(VertexAttributeType::Float, 2, -1, 0);
-        return GraphicsPtr(
-            RendererFactory::CreateGraphicsObject(1, PrimitiveType::TriangleList, &layout, 0, 0));
-    }
     void SetQuad(float l, float t, float r, float b) const {
         float const corners[] = {l, t, l, b, r, t, r, t, l, b, r, b};
         quad->SetVertices(0, corners, 6);
@@ -84,14 +85,13 @@ protected:
     static Picture With(Picture image, Color color, int x, int y, int w, int h) {
         return image.With(x, y, MakeImage(w, h, color));
     }
-    static RendererStatistics Count() { return RendererFactory::GetStatistics(); }
     static bool IsDeferred() { return GetParam(); }
 
     TexturePtr texture = MakeTexture(kSize, kSize);
     TargetPtr target = MakeTarget(*texture);
     Brush const colored{kColored, "color"};
     Brush const textured{kTextured, "texel"};
-    GraphicsPtr quad = MakeQuad();
+    GraphicsPtr quad = MakeGraphics(1);
     BlendPtr blend{RendererFactory::CreateBlendStateObject(BlendStateDescriptor(true))};
     StatePtr stencil{RendererFactory::CreateDepthStencilState(DepthStencilStateDescriptor(false, false))};
 };

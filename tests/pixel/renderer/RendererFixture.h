@@ -93,6 +93,7 @@ protected:
 
     // The error lines since the last call; one that nobody takes fails the test.
     std::vector<std::string> TakeErrors();
+    static RendererStatistics Count() { return RendererFactory::GetStatistics(); }
     // For tests that make the driver complain on purpose.
     void ForgetDriverErrors();
 

@@ -51,6 +51,10 @@ constexpr struct {
 
 } // namespace
 
+double Distance(Rgba const& a, Rgba const& b) {
+    return std::max({std::abs(a.r - b.r), std::abs(a.g - b.g), std::abs(a.b - b.b), std::abs(a.a - b.a)});
+}
+
 Rgba FromBytes(Color const& c) { return {c[0] / 255.0, c[1] / 255.0, c[2] / 255.0, c[3] / 255.0}; }
 
 Color ToBytes(Rgba const& c) {

@@ -28,6 +28,7 @@ struct Shape {
 double InsetIn(RectF const& r, PointD const& p);
 RectF Grown(RectF const& r, double by);
 RectF Sorted(RectF const& r);
+RectF Box(double left, double top, double right, double bottom); // sorted
 
 Shape FilledRect(RectF const& r, bool antiAliased);
 Shape StrokedRect(RectF const& r, double width, bool antiAliased);

@@ -13,14 +13,11 @@ constexpr double kBlending = 1.5;
 constexpr double kStoring = 0.6;
 
 // In steps of 255.
-double Distance(Rgba const& a, Rgba const& b) {
-    return 255 *
-           std::max({std::abs(a.r - b.r), std::abs(a.g - b.g), std::abs(a.b - b.b), std::abs(a.a - b.a)});
-}
+double CountSteps(Rgba const& a, Rgba const& b) { return 255 * Distance(a, b); }
 
 double Bend(Rgba const& before, Rgba const& at, Rgba const& after) {
-    return Distance({before.r + after.r, before.g + after.g, before.b + after.b, before.a + after.a},
-                    {2 * at.r, 2 * at.g, 2 * at.b, 2 * at.a});
+    return CountSteps({before.r + after.r, before.g + after.g, before.b + after.b, before.a + after.a},
+                      {2 * at.r, 2 * at.g, 2 * at.b, 2 * at.a});
 }
 
 // One step off in every channel.
@@ -106,10 +103,10 @@ private:
             double const blur = brush->blur ? GetBlur(*brush, *p, exact, basis) : 0;
             if (!ink && blur == 0) continue;
             Rgba const stored = RoundedToBytes(exact);
-            double const shown = Distance(Mix(ink, Nudged(basis), Nudged(basis)), exact);
+            double const shown = CountSteps(Mix(ink, Nudged(basis), Nudged(basis)), exact);
             bool const blends = shown > 0 || brush->blur || mPainting.mode == MKPaint::SrcNonPremultiplied;
             double const slack = pixel.slack * shown + (blends ? kBlending : kStoring) +
-                                 Distance(stored, exact) + blur + (ink ? ink->slack : 0) + 1e-3;
+                                 CountSteps(stored, exact) + blur + (ink ? ink->slack : 0) + 1e-3;
             pixel.slack = static_cast<int>(std::min(slack, 255.0));
             pixel.color = stored;
         }
@@ -119,8 +116,8 @@ private:
     double GetBlur(Brush const& brush, PointD const& p, Rgba const& exact, Rgba const& basis) const {
         double sum = 0;
         for (PointD const& d : *brush.blur) {
-            sum += std::max(Distance(Mix(Touch(brush, {p.x + d.x, p.y + d.y}), basis, basis), exact),
-                            Distance(Mix(Touch(brush, {p.x - d.x, p.y - d.y}), basis, basis), exact));
+            sum += std::max(CountSteps(Mix(Touch(brush, {p.x + d.x, p.y + d.y}), basis, basis), exact),
+                            CountSteps(Mix(Touch(brush, {p.x - d.x, p.y - d.y}), basis, basis), exact));
         }
         return sum;
     }
@@ -133,7 +130,7 @@ private:
             Rgba const one = Evaluate({x, y, -d.x, -d.y}, before, brushes);
             Rgba const other = Evaluate({x, y, d.x, d.y}, before, brushes);
             if (!mIsCoarse && Bend(one, here, other) <= kLargestBend) continue;
-            jump += std::max(Distance(one, here), Distance(other, here));
+            jump += std::max(CountSteps(one, here), CountSteps(other, here));
         }
         return jump;
     }
