@@ -1,5 +1,5 @@
-# CheckLoading: fails when a shared library could not be loaded on a device with 16 KB pages, or when its
-# exported names are not those that it is to have.
+# CheckLoading: fails if a shared library could not be loaded on a device with 16 KB pages, or if its exported names differ
+# from the list.
 # cmake -DLIBRARY=file -DREADELF=... -DNM=... [-DEXPORTS=list] -P CheckLoading.cmake
 cmake_policy(VERSION 3.25)
 
@@ -26,7 +26,7 @@ file(STRINGS ${EXPORTS} expected REGEX "^[^#]")
 set(missing ${expected})
 list(FILTER missing EXCLUDE REGEX "::")
 
-# Mangled names: what kind of thing it is, then the namespaces and the name, each behind its length.
+# Mangled names consist of the kind of symbol, the namespaces and the name; each name follows its length.
 set(kind "_Z(T[VIST]|Th[0-9n]+_|Tv[0-9n]+_[0-9n]+_|GV)?Z?")
 set(errors "")
 execute_process(COMMAND ${NM} -D --defined-only ${LIBRARY} OUTPUT_VARIABLE symbols COMMAND_ERROR_IS_FATAL ANY)
@@ -38,7 +38,7 @@ foreach(symbol IN LISTS symbols)
     set(name "${CMAKE_MATCH_2}::${name}")
     string(REPLACE "6detail" "::detail" name "Moka${name}")
   elseif(symbol MATCHES "^[VWu] ${kind}N?K?(S[tabsiod]|9__gnu_cxx)")
-    continue() # the standard library's templates, which every library has
+    continue() # templates of the standard library, which every library exports
   else()
     string(SUBSTRING "${symbol}" 2 -1 name)
     list(REMOVE_ITEM missing ${name})

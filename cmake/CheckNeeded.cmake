@@ -1,4 +1,4 @@
-# CheckNeeded: fails the build when a shared library needs more than it may, or imports GL or EGL itself.
+# CheckNeeded: fails the build if a shared library needs a library that is not allowed, or imports GL or EGL functions.
 # cmake -DLIBRARY=file -DALLOWED="name;name" -DREADELF=... -DNM=... -P CheckNeeded.cmake
 # Beyond ALLOWED (file names without version) only the C++ runtime and sanitizer runtimes are accepted.
 cmake_policy(VERSION 3.25)

@@ -1,4 +1,4 @@
-# Run first by cmake --install: fails, with one line, where nothing can be written.
+# cmake --install runs this first. It fails with one line if the prefix is not writable.
 set(folder "$ENV{DESTDIR}${CMAKE_INSTALL_PREFIX}")
 execute_process(COMMAND ${CMAKE_COMMAND} -E make_directory "${folder}" RESULT_VARIABLE result ERROR_QUIET)
 if(result EQUAL 0)

@@ -1,15 +1,15 @@
 # Run at build time: writes GLSL files into a C++ header.
 #   cmake -DOUTPUT=header -DFOLDER=folder "-DPROGRAMS=Class:file.vert:file.frag;..."
 #     -P EmbedShaders.cmake
-# For each class the header has kClassVertex and kClassFragment;
-# a file that several programs use is there once.
+# For each class the header defines kClassVertex and kClassFragment.
+# A file that several programs use is embedded once.
 cmake_minimum_required(VERSION 3.25)
 
 set(texts "")
 set(programs "")
 set(embedded "")
 
-# The constant's name of a file: kText_bitmap_vert.
+# The name of a file's constant: kText_bitmap_vert.
 function(embed file result)
   string(MAKE_C_IDENTIFIER "kText_${file}" name)
   set(${result} ${name} PARENT_SCOPE)

@@ -1,12 +1,12 @@
-# Run by CPack when the files of the packages lie in place, before they are packed: adds what Debian demands of a
-# package, and checks what the libraries export.
+# CPack runs this after it has staged the files of the packages: adds the files that Debian requires, and checks the
+# exports of the libraries.
 cmake_policy(VERSION 3.25)
 
 macro(run)
   execute_process(COMMAND ${ARGN} COMMAND_ERROR_IS_FATAL ANY)
 endmacro()
 
-# The changelog: one entry, which sends the reader to the project's own.
+# The changelog: one entry that refers to the project's changelog.
 string(TIMESTAMP date "%a, %d %b %Y %H:%M:%S +0000" UTC)
 set(changelog "${CPACK_PACKAGE_NAME} (${CPACK_PACKAGE_VERSION}-${CPACK_DEBIAN_PACKAGE_RELEASE}) unstable; urgency=medium
 
@@ -27,7 +27,7 @@ foreach(component IN LISTS CPACK_COMPONENTS_ALL)
   file(GLOB pages ${root}/share/man/man*/*)
   run(gzip -9nf ${documents}/changelog ${documents}/changelog.Debian ${pages})
 
-  # In the system's own folders nothing is searched for.
+  # Libraries in the system's folders need no run path.
   file(GLOB programs ${root}/bin/* ${root}/${MOKA_LIBDIR}/*.so.*.*.*)
   foreach(program IN LISTS programs)
     file(RPATH_REMOVE FILE ${program})
@@ -43,7 +43,7 @@ set(libraries ${stage}/MokaRuntime${CPACK_PACKAGING_INSTALL_PREFIX}/${MOKA_LIBDI
 set(exports "")
 if("MokaJava" IN_LIST CPACK_COMPONENTS_ALL)
   set(exports -DEXPORTS=${MOKA_SOURCE_DIR}/cmake/exports.txt)
-  # Where Debian's Java looks for native libraries.
+  # The folder in which Debian's Java finds native libraries.
   set(folder ${stage}/MokaJava${CPACK_PACKAGING_INSTALL_PREFIX}/${MOKA_LIBDIR}/jni)
   file(MAKE_DIRECTORY ${folder})
   file(CREATE_LINK ../libMokaGraphics.so.${MOKA_SOVERSION} ${folder}/libMokaGraphics.so SYMBOLIC)
@@ -51,7 +51,7 @@ endif()
 run(${CMAKE_COMMAND} -DLIBRARY=${libraries}/libMokaGraphics.so.${CPACK_PACKAGE_VERSION} -DREADELF=${MOKA_READELF}
   -DNM=${MOKA_NM} ${exports} -P ${MOKA_SOURCE_DIR}/cmake/CheckLoading.cmake)
 
-# The symbols that others may link to, with the version that they came with. Not the standard library's templates.
+# The exported symbols, with the version that added them, without templates of the standard library.
 file(GLOB files ${libraries}/*.so.*.*.*)
 list(TRANSFORM files PREPEND -e)
 set(symbols ${MOKA_BINARY_DIR}/debian/symbols)

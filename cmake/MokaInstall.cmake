@@ -1,7 +1,7 @@
-# What is installed, and where. CPack makes a package of each component (MokaPackages.cmake).
+# The install rules. CPack makes a package of each component (MokaPackages.cmake).
 include(CMakePackageConfigHelpers)
 
-# A debug build has the same names in a folder of its own, so that one prefix can have both.
+# The libraries of a debug build have the same names in another folder, so that one prefix can contain both builds.
 set(MOKA_INSTALL_LIBDIR ${CMAKE_INSTALL_LIBDIR}$<$<CONFIG:Debug>:/moka-debug>)
 set(MOKA_INSTALL_BINDIR $<IF:$<CONFIG:Debug>,${CMAKE_INSTALL_LIBDIR}/moka-debug/bin,${CMAKE_INSTALL_BINDIR}>)
 set(MOKA_INSTALL_CMAKEDIR ${CMAKE_INSTALL_LIBDIR}/cmake/MokaGraphics)
@@ -19,8 +19,8 @@ function(moka_install_if_built what file)
   endif()" ALL_COMPONENTS)
 endfunction()
 
-# moka_install(PART NAME ...): these libraries and their public headers, in the tree they have here, as a part of
-# what find_package(MokaGraphics) gives.
+# moka_install(PART NAME ...): installs these libraries and their public headers, in the folders of this tree, as a part of
+# the package MokaGraphics.
 function(moka_install part)
   install(TARGETS ${ARGN} EXPORT MokaGraphics${part}Targets
     LIBRARY DESTINATION ${MOKA_INSTALL_LIBDIR} COMPONENT MokaRuntime NAMELINK_COMPONENT MokaDevelopment
@@ -31,7 +31,7 @@ function(moka_install part)
 endfunction()
 
 # moka_install_pkg_config(NAME DESCRIPTION LIBS [REQUIRES ...] [STATIC ...]): NAME.pc. LIBS is for the linker;
-# STATIC are the packages that a static library needs in addition. It finds the prefix from where it lies.
+# STATIC are the packages that a static library needs in addition. The prefix is relative to the file.
 function(moka_install_pkg_config name description libs)
   cmake_parse_arguments(PARSE_ARGV 3 arg "" "" "REQUIRES;STATIC")
   if(NOT BUILD_SHARED_LIBS)
@@ -59,7 +59,7 @@ function(moka_install_config)
   set(made ${PROJECT_BINARY_DIR}/cmake)
   configure_file(${PROJECT_SOURCE_DIR}/cmake/MokaGraphicsConfig.cmake.in ${made}/MokaGraphicsConfig.cmake @ONLY)
   write_basic_package_version_file(${made}/MokaGraphicsConfigVersion.cmake COMPATIBILITY SameMinorVersion)
-  # CMake prints this text beside what was looked at.
+  # CMake prints this text with the versions that it has considered.
   file(APPEND ${made}/MokaGraphicsConfigVersion.cmake "
 if(NOT PACKAGE_VERSION_COMPATIBLE)
   string(APPEND PACKAGE_VERSION \" (ask for ${PROJECT_VERSION_MAJOR}.${PROJECT_VERSION_MINOR}, or install the version that you ask for)\")

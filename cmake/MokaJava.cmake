@@ -1,12 +1,12 @@
-# How the Java sources are compiled and packed: with a JDK's own tools, where there is one.
+# Compiles and packs the Java sources with the tools of a JDK, if there is one.
 find_package(Java 11 QUIET COMPONENTS Runtime Development)
 
-# For an older Java than any that is found: the VM may be another one than javac's.
+# Compiles for Java 11, because the VM may be older than javac.
 set(MOKA_JAVAC ${Java_JAVAC_EXECUTABLE} --release 11 -encoding UTF-8 -Xlint:all -Werror)
 
 # moka_jar(NAME OUTPUT file SOURCES ... [OPTIONS ...] [JARS ...] [RULES file]): the target NAME makes the jar,
-# and its property MOKA_JAR is the path. JARS are targets of this function to compile against. RULES goes
-# where Android's tools look for what must keep its name.
+# and its property MOKA_JAR is the path. JARS are targets of this function to compile against. RULES are keep rules; the jar
+# has them in the folder in which Android's tools find them.
 function(moka_jar name)
   cmake_parse_arguments(PARSE_ARGV 1 arg "" "OUTPUT;RULES" "SOURCES;OPTIONS;JARS")
   set(jar ${CMAKE_CURRENT_BINARY_DIR}/${arg_OUTPUT})
@@ -26,7 +26,7 @@ function(moka_jar name)
       COMMAND ${CMAKE_COMMAND} -E copy ${arg_RULES} ${folder}/${name}.pro)
   endif()
   add_custom_command(OUTPUT ${jar} VERBATIM
-    # Classes of sources that are gone must not stay.
+    # Removes classes whose sources were deleted.
     COMMAND ${CMAKE_COMMAND} -E rm -rf ${classes}
     COMMAND ${MOKA_JAVAC} ${arg_OPTIONS} -classpath "${classPath}" -d ${classes} ${arg_SOURCES}
     ${copyRules}

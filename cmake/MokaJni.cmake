@@ -1,6 +1,6 @@
-# Finds the folders of a JDK's jni.h: MOKA_JNI_HEADERS, empty without a JDK. Used here and by installed packages.
+# Finds the folders of a JDK's jni.h and sets MOKA_JNI_HEADERS; empty without a JDK. This tree and installed packages use it.
 function(moka_find_jni result)
-  # CMake's own search misses JDKs younger than it, so it is told where javac lies.
+  # CMake's search does not find JDKs that are newer than CMake, so pass it the folder of javac.
   find_package(Java QUIET COMPONENTS Development)
   if(Java_JAVAC_EXECUTABLE AND NOT DEFINED JAVA_HOME)
     file(REAL_PATH ${Java_JAVAC_EXECUTABLE} javac)
@@ -9,7 +9,7 @@ function(moka_find_jni result)
   endif()
   find_package(JNI QUIET COMPONENTS JVM)
   set(headers "")
-  # By the headers, which is all that is needed: the package also asks for the VM.
+  # Checks the headers only, because the package's result also requires the VM.
   if(JAVA_INCLUDE_PATH AND JAVA_INCLUDE_PATH2)
     set(headers ${JAVA_INCLUDE_PATH} ${JAVA_INCLUDE_PATH2})
   endif()

@@ -1,4 +1,4 @@
-# How every target of this tree is compiled, and the functions that declare one.
+# The compiler flags of all targets, and the functions that declare targets.
 
 # Flags for all our code. No contraction: x86-64 and arm64 must agree to the bit.
 add_library(moka_compile_options INTERFACE)
@@ -7,7 +7,7 @@ target_compile_options(moka_compile_options INTERFACE
   $<$<BOOL:${MOKA_WARNINGS_AS_ERRORS}>:-Werror>)
 target_compile_definitions(moka_compile_options INTERFACE $<$<CONFIG:Debug>:MOKA_CHECKS=1>)
 if(MOKA_SANITIZE)
-  # Line numbers are all that a report needs; the rest of the debugging information takes as long as compiling.
+  # Reports need only line numbers; full debugging information would double the compile time.
   target_compile_options(moka_compile_options INTERFACE
     -fsanitize=${MOKA_SANITIZE} -fno-sanitize-recover=all -fno-omit-frame-pointer -O1 -g1)
   target_link_options(moka_compile_options INTERFACE -fsanitize=${MOKA_SANITIZE})
@@ -17,7 +17,7 @@ set(CMAKE_POSITION_INDEPENDENT_CODE ON)
 set(CMAKE_CXX_VISIBILITY_PRESET hidden)
 set(CMAKE_VISIBILITY_INLINES_HIDDEN ON)
 
-# What keeps its binary interface has the same number: the minor version counts while the major one is 0.
+# The number of the binary interface. While the major version is 0, it includes the minor version.
 set(MOKA_SOVERSION ${PROJECT_VERSION_MAJOR})
 if(PROJECT_VERSION_MAJOR EQUAL 0)
   string(APPEND MOKA_SOVERSION .${PROJECT_VERSION_MINOR})
@@ -26,10 +26,10 @@ set(MOKA_GENERATED_HEADERS ${PROJECT_BINARY_DIR}/include)
 configure_file(${PROJECT_SOURCE_DIR}/cmake/Version.h.in ${MOKA_GENERATED_HEADERS}/moka/base/Version.h @ONLY)
 
 # moka_library(NAME KIND [OUTPUT name] [EXPORT name] SOURCES ... HEADERS ... PUBLIC deps PRIVATE deps)
-# KIND is what add_library takes, or LIBRARY: shared, and static with BUILD_SHARED_LIBS=OFF. EXPORT is the name
-# that others link, as Moka::name: an alias here, and the installed target.
-# HEADERS is the one list of public headers: what is installed, and what the build compiles alone, each in a
-# translation unit of its own, so that a header which needs another one included first does not build.
+# KIND is that of add_library, or LIBRARY: shared, or static with BUILD_SHARED_LIBS=OFF. EXPORT is the name that others link,
+# as Moka::name: an alias in this tree, and the installed target.
+# HEADERS is the list of public headers. They are installed. The build also compiles each one alone, so that a header which
+# depends on an earlier include does not build.
 function(moka_library name kind)
   cmake_parse_arguments(PARSE_ARGV 2 arg "" "OUTPUT;EXPORT" "SOURCES;HEADERS;PUBLIC;PRIVATE")
   if(kind STREQUAL "LIBRARY" AND BUILD_SHARED_LIBS)
@@ -39,7 +39,7 @@ function(moka_library name kind)
   endif()
   add_library(${name} ${kind} ${arg_SOURCES})
   if(kind STREQUAL "SHARED")
-    # Loadable where pages have 16 KB, as on new Android devices.
+    # Loadable on devices with 16 KB pages, such as new Android devices.
     target_link_options(${name} PRIVATE -Wl,-z,max-page-size=16384)
   endif()
   set(scope PUBLIC)
@@ -59,7 +59,7 @@ function(moka_library name kind)
     target_link_libraries(${name} PRIVATE $<BUILD_INTERFACE:moka_compile_options> ${arg_PRIVATE})
   endif()
   if(arg_OUTPUT)
-    # Installed, the libraries find each other where they lie.
+    # Installed libraries find each other in their own folder.
     set_target_properties(${name} PROPERTIES
       OUTPUT_NAME ${arg_OUTPUT} VERSION ${PROJECT_VERSION} SOVERSION ${MOKA_SOVERSION} INSTALL_RPATH "\$ORIGIN")
   endif()
@@ -71,9 +71,9 @@ function(moka_library name kind)
 endfunction()
 
 # moka_compile_as_one(NAME FOLDER...)
-# Compiles the target's sources in these folders as one, so that their short functions become part of each other:
-# recording a rectangle takes a fifth less time. Names in their anonymous namespaces have to differ. Debug builds,
-# which the tests use, compile each source alone.
+# Compiles the target's sources in these folders as one source, so that short functions are inlined: recording a rectangle
+# takes a fifth less time. Names in anonymous namespaces must be unique across these folders. Debug builds, which the tests
+# use, compile each source alone.
 function(moka_compile_as_one name)
   if(CMAKE_BUILD_TYPE STREQUAL "Debug")
     return()

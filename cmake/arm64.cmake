@@ -1,4 +1,4 @@
-# Toolchain: Debian's cross compiler, the libraries of scripts/fetch-arm64, and programs run by qemu-user.
+# Toolchain file: Debian's cross compiler, the libraries of scripts/fetch-arm64, and qemu-user to run programs.
 set(CMAKE_SYSTEM_NAME Linux)
 set(CMAKE_SYSTEM_PROCESSOR aarch64)
 set(CMAKE_CXX_COMPILER aarch64-linux-gnu-g++)
@@ -13,7 +13,7 @@ set(CMAKE_FIND_ROOT_PATH_MODE_PACKAGE ONLY)
 set(ENV{PKG_CONFIG_SYSROOT_DIR} ${root})
 set(ENV{PKG_CONFIG_LIBDIR} ${root}/usr/lib/aarch64-linux-gnu/pkgconfig:${root}/usr/share/pkgconfig)
 
-# What the libraries need themselves.
+# The dependencies of the libraries.
 set(libraries ${root}/usr/lib/aarch64-linux-gnu:${root}/lib/aarch64-linux-gnu)
 set(CMAKE_EXE_LINKER_FLAGS_INIT -Wl,-rpath-link,${libraries})
 set(CMAKE_SHARED_LINKER_FLAGS_INIT -Wl,-rpath-link,${libraries})

@@ -1,6 +1,6 @@
-// AppQueue: the queue of an application that owns the GL context itself. Any thread posts; the thread that has the
-// context calls Run() when it is current.
-// A task that waits belongs on another thread: on the context's own, waiting runs what is queued instead.
+// AppQueue: the queue of an application that owns the GL context itself. Any thread may post. The thread of
+// the context calls Run() while the context is current.
+// On the thread of the context, WaitForTasks() runs the queued tasks.
 #pragma once
 
 #include "moka/graphics/task/IGLMsgQueue.h"
@@ -31,8 +31,8 @@ public:
         mChanged.wait(lock, [this, target = mPosted] { return mDone >= target; });
     }
 
-    // On the thread that made the queue, with its context current. Runs each task once, in posting order, without
-    // the lock; also those that tasks post.
+    // Runs all tasks in posting order, including those that tasks post. Call it on the thread that created
+    // the queue, with the context current. The lock is not held while a task runs.
     void Run() {
         while (std::unique_ptr<Moka::ITask> task{Take()}) {
             task->run();

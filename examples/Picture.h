@@ -1,4 +1,4 @@
-// Picture: what each example draws: a ruled page as large as the window, with a card and a highlighter over it.
+// Picture: the picture of all examples: a ruled page of the window's size, with a card and a highlighter.
 #pragma once
 
 #include "moka/graphics/MokaGraphics.h"

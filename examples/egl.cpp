@@ -1,4 +1,4 @@
-// A window of plain Xlib, and the application's own EGL context and queue in it, on one thread.
+// Draws in an Xlib window with the application's own EGL context and queue, on one thread.
 #include "examples/AppQueue.h"
 #include "examples/Picture.h"
 #include "moka/base/RefPtr.h"

@@ -1,4 +1,4 @@
-// A window of GLFW's; the render thread owns a context in it. GLFW itself makes none.
+// Draws in a GLFW window. The render thread owns the context; GLFW creates none.
 #include "examples/Picture.h"
 #include "moka/base/RefPtr.h"
 #include "moka/host/RenderThread.h"
@@ -15,7 +15,7 @@ namespace {
 
 using namespace Moka;
 
-// Of the size that the window has now: a screen bitmap keeps the one it was made with.
+// Creates a screen bitmap of the window's current size, because its size is fixed.
 void Show(GLFWwindow* window) {
     auto& queue = *static_cast<RenderThread*>(glfwGetWindowUserPointer(window));
     int width = 0;
@@ -40,7 +40,7 @@ int Run(GLFWwindow* window) {
     glfwSetFramebufferSizeCallback(window, [](GLFWwindow* resized, int, int) { Show(resized); });
     Show(window);
     while (!glfwWindowShouldClose(window)) glfwWaitEvents();
-    return 0; // the render thread stops before the window goes
+    return 0; // the render thread stops before the window is destroyed
 }
 
 } // namespace

@@ -1,4 +1,5 @@
-// A GtkGLArea of GTK 4: GTK owns the GLES context and the frame buffer, and says when to draw.
+// Draws in a GtkGLArea of GTK 4. GTK owns the GLES context and the frame buffer, and calls the render
+// handler.
 #include "examples/AppQueue.h"
 #include "examples/Picture.h"
 #include "moka/base/RefPtr.h"
@@ -29,7 +30,7 @@ gboolean Render(GtkGLArea* area, GdkGLContext*, gpointer) {
     int const height = gtk_widget_get_height(GTK_WIDGET(area)) * scale;
     RendererFactory::InvalidateState(); // GTK has used GL since the last frame
     {
-        // The frame buffer that GTK has bound, which is another one after a resize.
+        // Draws into the frame buffer that GTK has bound, which changes after a resize.
         auto const screen = RefPtr<IMKBitmap>::Adopt(
             MKGraphicsFactory::CreateScreenBitmap(&queue, 0, 0, width, height, 0, 1));
         auto const canvas =

@@ -1,4 +1,4 @@
-// A QOpenGLWidget of Qt 6: Qt owns the GLES context and the frame buffer, and says when to draw.
+// Draws in a QOpenGLWidget of Qt 6. Qt owns the GLES context and the frame buffer, and calls paintGL.
 #include "examples/AppQueue.h"
 #include "examples/Picture.h"
 #include "moka/base/RefPtr.h"
@@ -16,7 +16,7 @@ using namespace Moka;
 class PageWidget final : public QOpenGLWidget {
 public:
     ~PageWidget() override {
-        if (context()) context()->disconnect(this); // it goes after this part of the widget
+        if (context()) context()->disconnect(this); // the context is destroyed after this object
         Detach();
     }
 
@@ -25,7 +25,7 @@ protected:
         mIsAttached = RendererFactory::AttachContext();
         if (!mIsAttached) return;
         RendererFactory::SetDeferred(true); // this program flushes after each frame
-        // Moved into another window, the widget gets another context.
+        // If the widget moves to another window, it gets another context.
         connect(context(), &QOpenGLContext::aboutToBeDestroyed, this, [this] { Detach(); });
     }
 
@@ -35,7 +35,7 @@ protected:
         int const height = static_cast<int>(this->height() * devicePixelRatio());
         RendererFactory::InvalidateState(); // Qt has used GL since the last frame
         {
-            // The frame buffer that Qt has bound, which is another one after a resize.
+            // Draws into the frame buffer that Qt has bound, which changes after a resize.
             auto const screen = RefPtr<IMKBitmap>::Adopt(
                 MKGraphicsFactory::CreateScreenBitmap(&mQueue, 0, 0, width, height, 0, 1));
             auto const canvas =

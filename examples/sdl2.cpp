@@ -1,4 +1,4 @@
-// A window of SDL 2's; the render thread owns a context in it. SDL itself makes none.
+// Draws in an SDL 2 window. The render thread owns the context; SDL creates none.
 #include "examples/Picture.h"
 #include "moka/base/RefPtr.h"
 #include "moka/host/RenderThread.h"
@@ -22,7 +22,7 @@ bool GetNativeWindow(SDL_Window* window, RenderThreadOptions& options) {
     return true;
 }
 
-// Of the size that the window has now: a screen bitmap keeps the one it was made with.
+// Creates a screen bitmap of the window's current size, because its size is fixed.
 bool Show(RenderThread& queue, SDL_Window* window) {
     int width = 0;
     int height = 0;
@@ -31,7 +31,7 @@ bool Show(RenderThread& queue, SDL_Window* window) {
         RefPtr<IMKBitmap>::Adopt(MKGraphicsFactory::CreateScreenBitmap(&queue, 0, 0, width, height, 1, 1));
     auto const canvas = RefPtr<IMKCanvas>::Adopt(MKGraphicsFactory::CreateCanvas(&queue, screen.Get(), 1));
     Examples::DrawPicture(*canvas, width, height);
-    return queue.Present(); // waits while two frames are on their way
+    return queue.Present(); // waits while two frames are in flight
 }
 
 int Run(SDL_Window* window) {
@@ -47,7 +47,7 @@ int Run(SDL_Window* window) {
                                               event.window.event == SDL_WINDOWEVENT_SIZE_CHANGED);
         if (isStale) isShown = Show(*queue, window);
     }
-    return isShown ? 0 : 1; // the render thread stops before the window goes
+    return isShown ? 0 : 1; // the render thread stops before the window is destroyed
 }
 
 } // namespace

@@ -41,7 +41,7 @@ RefPtr<Drawable> MakeDrawable(Arguments&&... arguments) {
     return drawable;
 }
 
-// A bitmap of this size that holds what draw puts onto a canvas over it.
+// Creates a bitmap of this size and calls draw with a canvas on it.
 template <class Draw>
 BitmapPtr DrawAside(SceneStage& stage, int width, int height, Draw const& draw) {
     BitmapPtr target = NewBitmap(*stage.GetQueue(), width, height);
@@ -68,7 +68,7 @@ void DrawCrossFade(IMKCanvas& canvas, SceneStage& stage) {
         auto const fade = MakeDrawable<MKBlendedBitmapDrawable>(stage.GetQueue(), first.Get(), second.Get(),
                                                                 RectF(0, 0, 96, 110),
                                                                 RectF(x, 14, x + 96, 124), 0.0f, 0.0f);
-        // The drawable has taken these references over.
+        // The drawable owns these references now.
         static_cast<void>(first.Release());
         static_cast<void>(second.Release());
         MKPaint paint;
@@ -104,7 +104,8 @@ RefPtr<MKGaussianBlurDrawable> MakeBlur(SceneStage& stage, BitmapPtr const& bitm
     auto blur = MakeDrawable<MKGaussianBlurDrawable>(stage.GetQueue());
     blur->SetBitmap(bitmap.Get());
     blur->SetHorizotalDirection(direction == Direction::Across);
-    // Taps between texels, where the filter mixes two of them: at whole texels they would show as stripes.
+    // Samples lie between texels, where the filter mixes two of them. At whole texels stripes would be
+    // visible.
     blur->SetBlurAmount(1.5f);
     return blur;
 }
@@ -122,7 +123,7 @@ BitmapPtr BlurAcross(SceneStage& stage, BitmapPtr const& bitmap) {
 
 void DrawGaussianBlur(IMKCanvas& canvas, SceneStage& stage) {
     BitmapPtr const small = MakeBitmap(stage, "letters", 91, 72);
-    // With room around them for the blur and the shadow's offset.
+    // Leaves room around the letters for the blur and the offset of the shadow.
     BitmapPtr const letters = DrawAside(stage, kBlurWidth, kBlurHeight, [&](IMKCanvas& other) {
         MKPaint plain;
         other.DrawBitmap(small.Get(), 8, 8, &plain);
@@ -147,7 +148,7 @@ void DrawNonPremultiplied(IMKCanvas& canvas, SceneStage& stage) {
     BitmapPtr const veil = MakeBitmap(stage, "veil", 130, 120);
     BitmapPtr const gradient = MakeBitmap(stage, "gradient", 130, 120);
     MKPaint paint;
-    // Nowhere fully transparent: dividing by an alpha of 0 gives what the driver makes of it.
+    // No pixel is fully transparent, because the result of dividing by an alpha of 0 depends on the driver.
     BitmapPtr const pale = DrawAside(stage, 130, 120, [&](IMKCanvas& other) {
         MKPaint faint;
         faint.SetAlpha(0.3f);
@@ -179,7 +180,7 @@ Scene MakeScene(char const* name, char const* about, int width, int height, Draw
     scene.background = kPaper;
     scene.needsGpu = true;
     scene.draw = [name = scene.name, draw](IMKCanvas& canvas, SceneStage& stage) {
-        if (!stage.GetQueue()) throw SceneError(name + " draws on a GPU only");
+        if (!stage.GetQueue()) throw SceneError(name + " needs a GPU");
         draw(canvas, stage);
     };
     return scene;

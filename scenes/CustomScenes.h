@@ -1,4 +1,4 @@
-// CustomScenes.h: the scenes that draw custom drawables, which need a queue and bitmaps on the GPU.
+// CustomScenes.h: the scenes with custom drawables, which need a queue and bitmaps on the GPU.
 #pragma once
 
 #include "scenes/Scene.h"

@@ -10,7 +10,7 @@
 namespace Moka::Scenes {
 namespace {
 
-// The drawable is made for each draw, as make does of the bitmaps.
+// Returns an operation that draws the result of make(bitmaps). Each draw creates a new drawable.
 template <class Make>
 SceneOperation DrawMade(MKPaint const& paint, Make const& make) {
     return {[=](IMKCanvas& canvas, SceneBitmaps const& bitmaps) {
@@ -28,7 +28,7 @@ SceneOperation ReadBlendedBitmap(SceneFields& fields, SceneNames const& names) {
     return DrawMade(
         GetPaint(fields, names), [=, src = fields.GetRect("src"), dst = fields.GetRect("dst"),
                                   by = size ? ReadPoint(*size) : PointF()](SceneBitmaps const& bitmaps) {
-            // Takes these references over.
+            // The drawable takes ownership of these references.
             return new (std::nothrow)
                 MKBlendedBitmapDrawable(bitmaps.queue, RefPtr<IMKBitmap>(bitmaps[first]).Release(),
                                         RefPtr<IMKBitmap>(bitmaps[second]).Release(), src, dst, by.x, by.y);

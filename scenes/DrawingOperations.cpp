@@ -36,7 +36,7 @@ SceneOperation ReadDrawCircle(SceneFields& fields, SceneNames const& names) {
     }};
 }
 
-// The places of a batch: a list of them, or {"columns", "rows", "from", "step"} for a grid, in rows.
+// Reads the positions of a batch: a list, or {"columns", "rows", "from", "step"} for a grid, row by row.
 template <class Place, class ReadOne, class ReadGridPlace>
 std::vector<Place> ReadPlaces(SceneValue const& value, ReadOne const& readOne,
                               ReadGridPlace const& readGridPlace) {

@@ -9,15 +9,15 @@ namespace Moka::Scenes {
 namespace {
 
 constexpr float kStep = 1.5f; // pixels between the points of a smooth line
-constexpr float kTip = 4;     // points over which a long stroke begins and ends
+constexpr float kTip = 4;     // the number of points over which the ends of a long stroke become thin
 
-// Paths are pairs of numbers in hundredths of a small letter's height: x from where the letter begins, y up from
-// the baseline.
+// Paths are pairs of numbers in hundredths of a small letter's height: x from the beginning of the letter, y
+// up from the baseline.
 struct Letter {
     char character;
     float advance;
-    char const* body;   // joined to the letters beside it
-    char const* accent; // dots and bars, drawn when the word is finished
+    char const* body;   // joined to the neighbouring letters
+    char const* accent; // dots and bars, drawn after the word
 };
 
 // clang-format off
@@ -59,7 +59,7 @@ constexpr Letter kLetters[] = {
 };
 // clang-format on
 
-// Null for a character the hand does not know.
+// Returns null for an unknown character.
 Letter const* FindLetter(char character) {
     auto const found =
         std::find_if(std::begin(kLetters), std::end(kLetters),
@@ -67,7 +67,7 @@ Letter const* FindLetter(char character) {
     return found == std::end(kLetters) ? nullptr : found;
 }
 
-// Catmull-Rom: a cubic through b and c whose directions there follow their neighbours.
+// A Catmull-Rom spline: a cubic from b to c whose directions depend on the neighbours a and d.
 float Spline(float a, float b, float c, float d, float t) {
     return b + 0.5f * t * (c - a + t * (2 * a - 5 * b + 4 * c - d + t * (3 * (b - c) + d - a)));
 }
@@ -111,13 +111,14 @@ Path ReadPath(char const* text, float scale) {
     return path;
 }
 
-// -0.5 ... 0.5, without a pattern to the eye.
+// Returns a pseudo-random number, -0.5 ... 0.5.
 float Shake(unsigned& seed) {
     seed = seed * 1664525 + 1013904223;
     return static_cast<float>(seed >> 8) / static_cast<float>(1 << 24) - 0.5f;
 }
 
-// These begin at the top, on the right: a stroke that came from the letter before would cross them.
+// True for letters that begin at the top right. A stroke from the letter before would cross them, so they are
+// not joined.
 bool IsRound(char character) { return std::string("acdgo").find(character) != std::string::npos; }
 
 } // namespace

@@ -1,5 +1,5 @@
-// Hand: writes and sketches on a pen canvas, with the uneven, joined strokes of a hand.
-// Units: pixels, y down; at is the left end of the baseline.
+// Hand: draws handwriting and sketches on a pen canvas.
+// Units: pixels, y down. (x, y) is the left end of the baseline.
 #pragma once
 
 #include "scenes/ScenePen.h"
@@ -9,12 +9,12 @@
 
 namespace Moka::Scenes {
 
-using Path = std::vector<InkPoint>; // through which a stroke goes; the radius is the stroke's
+using Path = std::vector<InkPoint>; // the points of a stroke
 
 struct Ink {
     Vector4<float> color; // premultiplied
     float width = 2;
-    float xHeight = 20; // of a small letter
+    float xHeight = 20; // the height of a small letter
     float slant = 0.22f;
 };
 
@@ -22,9 +22,9 @@ class Hand {
 public:
     Hand(ScenePen& pen, IMKPenCanvas& canvas) : mPen(pen), mCanvas(canvas) {}
 
-    // Small letters, digits, spaces, commas and full stops.
+    // Writes small letters, digits, spaces, commas and full stops.
     void Write(std::string const& text, float x, float y, Ink const& ink);
-    // A smooth line through pairs of x and y, in one string: "10 20 30 40". Twice is how a hand sketches.
+    // Draws a smooth line through pairs of x and y in one string: "10 20 30 40".
     void Sketch(char const* points, float x, float y, Ink const& ink);
 
 private:
@@ -32,7 +32,7 @@ private:
 
     ScenePen& mPen;
     IMKPenCanvas& mCanvas;
-    unsigned mSeed = 1; // of the unevenness
+    unsigned mSeed = 1; // of the pseudo-random deviations
 };
 
 } // namespace Moka::Scenes

@@ -32,7 +32,7 @@ void WriteText(Hand& hand) {
     hand.Write("milk for ida, none for me", kTextLeft, line(6), MakeInk(0x2F6B55, 3.2f, 26, 0.26f));
 }
 
-// A jug on a boiler, with a knob and a handle; the middle is at x = 0.
+// The lines of a coffee pot, with its middle at x = 0.
 constexpr char const* kPot[] = {
     "-62 452 -74 520 -84 590 -92 650 -60 662 0 666 64 662 94 650",
     "94 650 86 590 76 520 64 452",
@@ -58,7 +58,7 @@ void SketchPot(Hand& hand, float x, float y) {
     Ink const faint = MakeInk(0x22304F, 1.7f, 29, 0.22f, 0.4f);
     for (char const* const part : kPot) {
         hand.Sketch(part, x, y, ink);
-        hand.Sketch(part, x + 2, y + 1, faint); // once more, a little aside
+        hand.Sketch(part, x + 2, y + 1, faint); // a second, shifted line
     }
     for (int i = 0; i < 13; ++i) {
         auto const n = static_cast<float>(i);
@@ -70,7 +70,7 @@ void SketchPot(Hand& hand, float x, float y) {
                     MakeInk(0x5B6C8E, 2.8f, 29, 0, 0.7f));
     for (float const side : {-72.0f, -36.0f, 0.0f, 36.0f, 72.0f})
         hand.Sketch("-8 706 -9 694 0 676 9 694 8 706", x + side, y, MakeInk(0xE07A2F, 3));
-    // From the first line to the valve it speaks of.
+    // An arrow from the first line of text to the valve.
     hand.Sketch("-246 282 -200 330 -152 440 -126 530 -80 578", x, y, MakeInk(0xB4382F, 3));
     hand.Sketch("-104 580 -78 580 -84 554", x, y, MakeInk(0xB4382F, 3));
 }

@@ -1,11 +1,11 @@
-// NoteScene.h: handwriting and a sketch on a page of a notebook, in ink that external GL code draws.
+// NoteScene.h: a notebook page with handwriting and a sketch, drawn by external GL code.
 #pragma once
 
 #include "scenes/Scene.h"
 
 namespace Moka::Scenes {
 
-// paper becomes the page with the ink on it, and then needs a GPU and a pen.
+// Adds the ink to the scene of the empty page, which then needs a GPU and a pen.
 void AddHandwriting(Scene& paper);
 
 } // namespace Moka::Scenes

@@ -16,7 +16,7 @@ constexpr Vector4<float> kInk{42 / 255.0f, 74 / 255.0f, 106 / 255.0f, 1};
 constexpr int kClipColor = static_cast<int>(0xFFF0D9A8);
 constexpr int kFrameColor = static_cast<int>(0xFFB07A2A);
 
-// Four loops, as a hand writes them: thick downwards, thin upwards, with a tip at both ends.
+// Returns four handwritten loops: thick downwards, thin upwards, with thin ends.
 std::vector<InkPoint> MakeLoops() {
     constexpr int kPoints = 320;
     constexpr float kTurns = 4;
@@ -32,7 +32,7 @@ std::vector<InkPoint> MakeLoops() {
     return points;
 }
 
-// What the ink is cut to, as colour below it and as a frame above it.
+// Shows the clip of the ink: a colour below it and a frame above it.
 struct Panel {
     IMKCanvas& canvas;
     RectF clip;

@@ -1,4 +1,4 @@
-// PenScenes.h: the scenes whose ink is drawn by foreign GL code through a pen canvas.
+// PenScenes.h: the scenes whose ink external GL code draws through a pen canvas.
 #pragma once
 
 #include "scenes/Scene.h"

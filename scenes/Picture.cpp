@@ -6,7 +6,7 @@
 namespace Moka::Scenes {
 namespace {
 
-// Straight, not premultiplied, 0 ... 255.
+// A colour with straight alpha (not premultiplied), 0 ... 255.
 struct Texel {
     int r = 0;
     int g = 0;
@@ -22,7 +22,7 @@ Texel Mix(Texel const& from, Texel const& to, int part, int whole) {
             Mix(from.a, to.a, part, whole)};
 }
 
-// 0 ... 255, without any pattern to the eye.
+// Returns a pseudo-random number for a pixel, 0 ... 255.
 int Noise(int x, int y) {
     std::uint32_t n = static_cast<std::uint32_t>(x) * 374761393u + static_cast<std::uint32_t>(y) * 668265263u;
     n = (n ^ n >> 13) * 1274126177u;
@@ -45,7 +45,8 @@ Texel Checker(Place const& p) {
     return isLight ? Texel{236, 239, 244, 255} : Texel{76, 102, 140, 255};
 }
 
-// A mountain's edge above the lower border, in 1/1000 of the height: a folded line.
+// Returns the height of a mountain's edge above the lower border, in 1/1000 of the image's height: a zigzag
+// line.
 int Ridge(int x, int width, int period, int low, int high) {
     int const at = x * 1000 / width % period;
     int const up = std::min(at, period - at) * 2;
@@ -70,7 +71,7 @@ Texel Photo(Place const& p) {
     return t;
 }
 
-// Of three sizes, down to single pixels.
+// Adds grain of three sizes, down to single pixels.
 Texel Grain(Place const& p) {
     constexpr int kWeights[] = {5, 3, 1};
     int grain = 0;
@@ -80,11 +81,12 @@ Texel Grain(Place const& p) {
     return t;
 }
 
-// Five columns and seven rows of each letter, top row first, the leftmost column the highest bit.
+// Bitmaps of letters, five columns and seven rows each: top row first, the highest bit is the leftmost
+// column.
 constexpr int kGlyphF[7] = {0b11111, 0b10000, 0b10000, 0b11110, 0b10000, 0b10000, 0b10000};
 constexpr int kGlyphR[7] = {0b11110, 0b10001, 0b10001, 0b11110, 0b10100, 0b10010, 0b10001};
 
-// Thirteen cells across (a margin, F, a gap, R, a margin) and nine down.
+// Divides the image into thirteen columns (margin, F, gap, R, margin) and nine rows.
 Texel Letters(Place const& p) {
     int const column = p.x * 13 / p.width - 1;
     int const row = p.y * 9 / p.height - 1;
@@ -103,7 +105,7 @@ Texel Veil(Place const& p) {
     return t;
 }
 
-// Distances in half pixels, from the middle; the edge is soft over a fifth of the radius.
+// Distances are in half pixels from the centre. The edge is soft over a fifth of the radius.
 Texel Disc(Place const& p) {
     int const dx = 2 * p.x + 1 - p.width;
     int const dy = 2 * p.y + 1 - p.height;

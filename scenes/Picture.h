@@ -1,5 +1,5 @@
-// Picture: an RGBA8, premultiplied image in memory, rows tightly packed, first row first, and pictures made by
-// rule for scenes to draw. These are the same on every machine: whole numbers only.
+// Picture: an image in memory, RGBA8, premultiplied, rows packed, top row first; and generated pictures for
+// scenes. They use integers only, so they are the same on every machine.
 #pragma once
 
 #include <algorithm>
@@ -29,13 +29,13 @@ struct Picture {
     }
     void SetColor(int x, int y, Color const& color) { std::copy_n(color.begin(), 4, At(x, y)); }
 
-    // The block that starts at (x, y), which must lie inside.
+    // Returns the block that starts at (x, y). It must lie inside the image.
     Picture Crop(int x, int y, int w, int h) const {
         Picture part(w, h);
         for (int row = 0; row < h && w > 0; ++row) std::copy_n(At(x, y + row), w * 4, part.At(0, row));
         return part;
     }
-    // A copy with part in the place of its own pixels from (x, y) on, which must lie inside.
+    // Returns a copy in which part replaces the pixels from (x, y) on. It must lie inside the image.
     Picture With(int x, int y, Picture const& part) const {
         Picture result = *this;
         for (int row = 0; row < part.height && part.width > 0; ++row)
@@ -61,13 +61,13 @@ private:
 // gradient  red grows to the right, green downwards; opaque
 // checker   squares of 8 pixels, light and dark; opaque
 // photo     a landscape with a sun; opaque
-// letters   "F" and "R" in two colours on nothing, so that any turn or mirror image shows
-// veil      stripes of four colours whose alpha grows from nothing on the left to opaque on the right
+// letters   "F" and "R" in two colours on transparency, so that every rotation and reflection is visible
+// veil      stripes of four colours whose alpha grows from transparent on the left to opaque on the right
 // disc      a disc with a soft edge, white; for masks
 // grain     the landscape with coarse grain, down to single pixels; opaque
 std::vector<std::string> const& GetPictureNames();
 
-// index is that of GetPictureNames().
+// Generates a picture. index is its position in GetPictureNames().
 Picture MakePicture(std::size_t index, int width, int height);
 
 } // namespace Moka::Scenes

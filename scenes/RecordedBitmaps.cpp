@@ -16,7 +16,7 @@ namespace {
 
 namespace fs = std::filesystem;
 
-// FNV-1a.
+// The FNV-1a hash.
 std::uint64_t Hash(std::vector<unsigned char> const& bytes) {
     std::uint64_t hash = 14695981039346656037u;
     for (unsigned char const byte : bytes) hash = (hash ^ byte) * 1099511628211u;
@@ -40,7 +40,7 @@ RecordedBitmaps::Result RecordedBitmaps::Record(IMKBitmap* bitmap) {
     if (width < 1 || height < 1) return {};
     std::vector<unsigned char> pixels(static_cast<std::size_t>(width) * static_cast<std::size_t>(height) * 4);
     bitmap->GetBitmapData(bitmap->GetBitmapRect(), pixels.data());
-    // Behind the read-back, when what was requested of the bitmap is done.
+    // After the read-back all requests for the bitmap are done, so the filter can be read.
     Key const key{Hash(pixels), width, height, GetTextureFilter(*bitmap)};
     auto const found = mNames.find(key);
     return found != mNames.end() ? Result{found->second, ""} : Write(pixels, key);
@@ -52,9 +52,9 @@ RecordedBitmaps::Result RecordedBitmaps::Write(std::vector<unsigned char>& pixel
         return {"", "a scene has no room for another bitmap"};
     std::error_code error;
     fs::create_directory(mPath, error);
-    if (error) return {"", "cannot make the folder " + mPath + ": " + error.message()};
+    if (error) return {"", "cannot create the folder " + mPath + ": " + error.message()};
     std::string const name = 'b' + std::to_string(mNames.size() + 1);
-    std::string const file = name + ".mki"; // keeps every byte; a PNG would not, of premultiplied colours
+    std::string const file = name + ".mki"; // keeps premultiplied colours exactly, unlike PNG
     String const path = String::FromFileName((fs::path(mPath) / file).string());
     Bitmap image;
     std::string reason;

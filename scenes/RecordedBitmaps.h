@@ -1,7 +1,7 @@
-// RecordedBitmaps: the bitmaps that a recording draws: each is read when it is drawn and written into a folder if
-// none of the same contents and filter is there yet. So a bitmap that changes between two draws is two files, and
-// two bitmaps that look alike are one.
-// Thread: where the bitmaps may be read.
+// RecordedBitmaps: the bitmaps of a recording. Each is read back when it is drawn, and written to a folder
+// unless one with the same contents and filter is there. So a bitmap that changes between two draws becomes
+// two files, and two equal bitmaps become one.
+// Thread: a thread that may read the bitmaps back.
 // Cost:   a read-back for each draw.
 #pragma once
 
@@ -20,14 +20,14 @@ namespace Moka::Scenes {
 
 class RecordedBitmaps {
 public:
-    // parent is the folder of the scene's file. The folder in it is made when the first bitmap is written.
+    // parent is the folder of the scene's file. `folder` in it is created when the first bitmap is written.
     RecordedBitmaps(std::string const& parent, std::string const& folder);
 
     struct Result {
-        std::string name;   // in the scene
-        std::string reason; // why it is not there
+        std::string name;   // the bitmap's name in the scene
+        std::string reason; // why it could not be recorded
     };
-    // Neither name nor reason: it cannot be sampled, and a canvas draws nothing.
+    // If the bitmap cannot be sampled, so that a canvas would not draw it, name and reason are empty.
     Result Record(IMKBitmap* bitmap);
 
     // {"b1": {"file": "scene.bitmaps/b1.mki"}, ...}
@@ -46,7 +46,7 @@ private:
     Result Write(std::vector<unsigned char>& pixels, Key const& key);
 
     std::string const mPath;
-    std::string const mFolder; // as the scene names it
+    std::string const mFolder; // relative to the scene's file
     std::map<Key, std::string> mNames;
     std::int64_t mPixels = 0;
     std::string mText;

@@ -15,13 +15,13 @@ void DrawableLine::AddBitmap(SceneLine& line, char const* key, IMKBitmap* bitmap
     line.AddText(key, recorded.name);
 }
 
-// As DrawableOperations reads them.
+// Writes the operations that DrawableOperations.cpp reads.
 std::optional<SceneLine> DrawableLine::Describe(IMKCustomDrawable& drawable) {
     if (auto const* const blend = dynamic_cast<MKBlendedBitmapDrawable const*>(&drawable)) {
         SceneLine line("DrawBlendedBitmap");
         AddBitmap(line, "first", blend->GetBitmapFirst());
         AddBitmap(line, "second", blend->GetBitmapSecond());
-        // Behind the read-back: a draw on the render thread may set the size.
+        // After the read-back, because a draw on the render thread may set the size.
         line.Add("src", blend->GetSrc()).Add("dst", blend->GetDst());
         return line.Add("size", PointF(blend->GetWidth(), blend->GetHeight()));
     }

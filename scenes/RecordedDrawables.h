@@ -1,4 +1,4 @@
-// RecordedDrawables.h: custom drawables of the library as operations of a scene.
+// RecordedDrawables.h: records custom drawables of the library as operations of a scene.
 #pragma once
 
 #include "scenes/RecordedBitmaps.h"
@@ -14,15 +14,16 @@ class IMKCustomDrawable;
 
 namespace Moka::Scenes {
 
-// A line whose fields name the bitmaps as bitmaps has them. Nothing for a drawable that no scene can say.
+// Describes a drawable as a line of a scene, with the bitmap names of RecordedBitmaps. Returns nothing for a
+// drawable that the scene format does not have.
 class DrawableLine {
 public:
     explicit DrawableLine(RecordedBitmaps& bitmaps) : mBitmaps(bitmaps) {}
 
     std::optional<SceneLine> Describe(IMKCustomDrawable& drawable);
-    // Of the last one described: a bitmap is missing that it cannot do without.
+    // True if the last drawable draws nothing, because a bitmap is missing.
     bool DrawsNothing() const { return mDrawsNothing; }
-    // Why a bitmap could not be recorded; empty if all could.
+    // Why a bitmap could not be recorded; empty if all were.
     std::string const& GetReason() const { return mReason; }
 
 private:

@@ -1,6 +1,5 @@
-// Scene: something to draw, with a name and a sentence: the gallery's pictures, the tests' and benchmarks'
-// subjects.
-// Units: pixels; colours 0 ... 1. The background is cleared to as it is, so its colour is premultiplied.
+// Scene: a named picture with a description, for the gallery, the tests and the benchmarks.
+// Units: pixels; colours 0 ... 1. The background colour is premultiplied.
 #pragma once
 
 #include "moka/base/Point.h"
@@ -36,9 +35,9 @@ enum class SceneGroup {
 
 char const* GetTitle(SceneGroup group);
 
-// A name for a part of a picture, for whoever shows it; it is not drawn.
+// A caption for a part of a picture. The gallery page shows it; it is not drawn.
 struct SceneLabel {
-    PointF at; // its top left corner
+    PointF at; // the top left corner of that part
     std::string text;
 };
 
@@ -49,31 +48,30 @@ struct Scene {
     int height = 0;
     Vector4<float> background; // transparent by default
     std::vector<SceneLabel> labels;
-    std::string text; // its JSON; empty for a scene that is code
+    std::string text; // the scene's JSON; empty for a scene in C++
 
     SceneGroup group = SceneGroup::Rectangles;
-    bool alsoInStrips = false; // worth seeing on a target of three strips as well
-    bool onScreen = false;     // meant for a screen bitmap; draws on any target
-    bool needsGpu = false; // makes objects of the GPU, or shows what drivers do: only on a stage with a queue
-    bool needsPen = false; // draws ink by foreign GL code: only on a stage with a pen
+    bool alsoInStrips = false; // the gallery shows it on a target of three strips as well
+    bool onScreen = false;     // for a screen bitmap; can be drawn on any target
+    bool needsGpu = false;     // needs a stage with a queue: it creates GPU objects or depends on the driver
+    bool needsPen = false;     // needs a stage with a pen, because external GL code draws ink
 
-    // On a new canvas, over what its target holds. May leave a matrix, clips and saves.
+    // Draws on a new canvas, over the present contents of its target. May leave a matrix, clips and saves.
     std::function<void(IMKCanvas&, SceneStage&)> draw;
 };
 
-// All of them, in the gallery's order. Any thread; made by the first call.
+// All scenes, in the gallery's order. Any thread. The first call creates them.
 std::vector<Scene> const& GetScenes();
 
-// Null when there is none of that name.
+// Returns the scene of this name, or null.
 Scene const* FindScene(std::string const& name);
 
-// Clears the target and draws. The target is as large as the scene; how many strips it has makes no
-// difference to the picture.
-// Fails: throws SceneError when the stage cannot make a bitmap; nothing has been drawn then but the
-//        background.
+// Clears the target and draws the scene. The target must have the scene's size and may have any number of
+// strips.
+// Fails: throws SceneError if the stage cannot create a bitmap. Only the background has been drawn then.
 void DrawScene(Scene const& scene, IMKCanvas& canvas, SceneStage& stage);
 
-// The largest texture side with which the scene's target has three strips, for scenes alsoInStrips.
+// Returns the largest texture side for which the scene's target has three strips.
 int GetSideForThreeStrips(Scene const& scene);
 
 } // namespace Moka::Scenes

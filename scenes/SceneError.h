@@ -1,4 +1,4 @@
-// SceneError: a scene that cannot be read or drawn; one line for the person who wrote it.
+// SceneError: thrown if a scene cannot be read or drawn. The message is one line for the author of the scene.
 #pragma once
 
 #include <stdexcept>
@@ -13,8 +13,8 @@ public:
     explicit SceneError(std::string const& message) : std::runtime_error(message) {}
 };
 
-// Before the file is known: what of its text is wrong. The message begins with ": " where it does not go on
-// with the name of the place, as " must be a number" does.
+// An error in a value. The path of the value and the file's name are added in front of the message, so it
+// begins with ": ", or with " must be", for example.
 class SceneValueError : public SceneError {
 public:
     SceneValueError(SceneValue const& value, std::string const& message)
@@ -26,7 +26,7 @@ private:
     SceneValue const* mValue; // in the tree that was read
 };
 
-// No tree could be read: what is wrong, and where.
+// An error in the JSON text, with its position.
 class SceneTextError : public SceneError {
 public:
     SceneTextError(int line, int column, std::string const& message)

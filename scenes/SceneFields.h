@@ -1,5 +1,5 @@
-// SceneFields.h: reads values of a scene, with messages for whoever wrote it.
-// Fails: throws SceneValueError: what was expected of the value, and what is there.
+// SceneFields.h: reads the values of a scene.
+// Fails: throws SceneValueError, whose message contains the expected value and the actual one.
 #pragma once
 
 #include "moka/base/Point.h"
@@ -18,25 +18,25 @@ bool ReadBool(SceneValue const& value);
 float ReadFloat(SceneValue const& value);
 int ReadInt(SceneValue const& value, int low = INT_MIN, int high = INT_MAX);
 std::string ReadText(SceneValue const& value);
-// form tells what the numbers are: "[x, y]".
+// form describes the numbers: "[x, y]".
 std::vector<float> ReadFloats(SceneValue const& value, std::size_t count, char const* form);
 PointF ReadPoint(SceneValue const& value);
 RectF ReadRect(SceneValue const& value);
 Matrix3f ReadMatrix(SceneValue const& value);
 // "#RRGGBB", "#AARRGGBB", or a list of 3 or 4 components.
 Vector4<float> ReadColor(SceneValue const& value);
-// A name stands for its position; any whole number is taken as it is.
+// Reads a name as its position in names, or any whole number.
 int ReadEnum(SceneValue const& value, std::vector<std::string> const& names);
 
-// What the calls above throw: "must be what is expected, not ...".
+// Throws the error of the functions above: " must be <expected>, not ...".
 [[noreturn]] void ThrowExpected(SceneValue const& value, std::string const& expected);
 
-// The fields of an object. One that nobody asked for is an error, found by CheckAll().
+// The fields of an object. CheckAll() throws if the object has a field that was not requested.
 class SceneFields {
 public:
     explicit SceneFields(SceneValue const& object);
 
-    // Null when it is not given.
+    // Returns the field, or null. Get throws instead.
     SceneValue const* Find(char const* key);
     SceneValue const& Get(char const* key);
 

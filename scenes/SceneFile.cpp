@@ -39,7 +39,7 @@ struct Content {
     void Draw(IMKCanvas& canvas, SceneStage& stage) const {
         SceneBitmaps bitmaps;
         bitmaps.queue = stage.GetQueue();
-        if (NeedsGpu() && !bitmaps.queue) throw SceneError("the scene draws on a GPU only");
+        if (NeedsGpu() && !bitmaps.queue) throw SceneError("the scene needs a GPU");
         for (ScenePicture const& one : pictures) {
             bitmaps.push_back(RefPtr<IMKBitmap>::Adopt(stage.MakeBitmap(one.picture)));
             if (!bitmaps.back()) throw SceneError("there is no room for the scene's bitmaps");
@@ -49,7 +49,7 @@ struct Content {
         steps.Play(canvas, bitmaps);
     }
 
-    // No two drivers filter mipmaps alike, and custom drawables have programs.
+    // Drivers filter mipmaps differently, and custom drawables need programs.
     bool NeedsGpu() const {
         return steps.needsGpu || std::any_of(pictures.begin(), pictures.end(), [](ScenePicture const& one) {
                    return one.filter != TextureFilterLinear;
@@ -57,10 +57,10 @@ struct Content {
     }
 };
 
-// A bitmap whose size is known and whose pixels are not there yet.
+// A bitmap whose size is known, before its pixels are loaded.
 struct BitmapPlan {
-    SceneValue const* source; // what says it
-    std::string path;         // of the file; empty for one made by rule
+    SceneValue const* source; // its description in the scene
+    std::string path;         // the path of the file; empty for a generated picture
     std::size_t kind = 0;
     int width = 0;
     int height = 0;

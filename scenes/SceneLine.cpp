@@ -16,8 +16,8 @@ void SceneLine::Begin(char const* key) {
     mFields += Quote(key) + ": ";
 }
 
-// The shortest text that is read as the same number, unless reading it in double precision first makes another
-// one of it; nine digits always do.
+// Writes the shortest text that is read back as the same float. Because it is read in double precision first,
+// some numbers need nine digits, which are always enough.
 void SceneLine::Write(float value) {
     if (!std::isfinite(value)) {
         mIsFinite = false;
@@ -30,7 +30,7 @@ void SceneLine::Write(float value) {
     if (static_cast<float>(read) != value)
         end = std::to_chars(text, text + sizeof(text), value, std::chars_format::general, 9).ptr;
     mFields.append(text, end);
-    // Without a point it is a whole number, which has no negative zero.
+    // Without a point it would be read as a whole number, which has no negative zero.
     if (value == 0 && std::signbit(value)) mFields += ".0";
 }
 

@@ -1,5 +1,5 @@
-// SceneLine: the text of one operation of a scene, as SceneSteps reads it, built field by field. Floats are written
-// so that they are read as the same ones.
+// SceneLine: builds the text of one operation of a scene field by field. SceneSteps reads it. Floats are read
+// back exactly.
 #pragma once
 
 #include "moka/base/Point.h"
@@ -14,7 +14,7 @@
 
 namespace Moka::Scenes {
 
-// With its quotation marks. What is not UTF-8 becomes a mark of its own.
+// Returns a JSON string with its quotation marks. Invalid UTF-8 becomes U+FFFD.
 std::string Quote(std::string const& text);
 
 class SceneLine {
@@ -32,13 +32,13 @@ public:
     SceneLine& Add(char const* key, std::vector<RectF> const& rects);
     SceneLine& Add(char const* key, std::vector<std::array<float, 3>> const& items);
     SceneLine& AddText(char const* key, std::string const& text) { return AddRaw(key, Quote(text)); }
-    // text is JSON.
+    // Adds a field whose value is JSON text.
     SceneLine& AddRaw(char const* key, std::string const& text);
 
     std::string const& GetOperation() const { return mOperation; }
-    // Of a list of numbers, as many as the scene counts operations for; 1 without a list.
+    // The number of operations that the line counts as: the items of its list, or 1.
     long long GetCount() const { return mCount; }
-    // False: a field has a number that JSON cannot say.
+    // False if a field has a number that JSON cannot represent.
     bool IsFinite() const { return mIsFinite; }
 
     // {"rect": [1, 2, 3, 4], ...}

@@ -5,7 +5,7 @@ namespace {
 
 using Kind = SceneValue::Kind;
 
-// Each in the order of its numbers.
+// The names of each enumeration, in the order of its numbers.
 std::vector<std::string> const kXFermodes{"Add",
                                           "Clear",
                                           "Dst",

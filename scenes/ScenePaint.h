@@ -1,4 +1,5 @@
-// ScenePaint.h: paints of a scene, under the names that MKPaint gives its properties.
+// ScenePaint.h: reads and writes the paints of a scene. The names of fields are those of MKPaint's
+// properties.
 #pragma once
 
 #include "moka/graphics/paint/MKPaint.h"
@@ -12,10 +13,10 @@ namespace Moka::Scenes {
 
 using NamedPaints = std::map<std::string, MKPaint>;
 
-// A name out of those given, or an object; "base" in it names the paint that it changes.
+// Reads the name of a paint, or an object; its field "base" names the paint that it modifies.
 MKPaint ReadPaint(SceneValue const& value, NamedPaints const& named);
 
-// What ReadPaint makes the same paint of: an object's fields.
+// Returns the fields of an object that ReadPaint reads as the same paint.
 SceneLine DescribePaint(MKPaint const& paint);
 
 } // namespace Moka::Scenes

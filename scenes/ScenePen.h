@@ -1,6 +1,6 @@
-// ScenePen: foreign code that draws ink with GL calls of its own, through a pen canvas. Scenes know no GL, so
-// whoever draws them brings one along, or leaves those scenes out.
-// Thread: any but the render thread.
+// ScenePen: draws ink with external GL code through a pen canvas. Scenes use no GL, so the program that draws
+// them implements this interface, or leaves those scenes out.
+// Thread: any except the render thread.
 #pragma once
 
 #include "moka/graphics/math/Vector.h"
@@ -15,7 +15,7 @@ class IMKPenCanvas;
 
 namespace Moka::Scenes {
 
-// In the pixels of the canvas's matrix.
+// A point in coordinates before the canvas's matrix.
 struct InkPoint {
     float x;
     float y;
@@ -26,8 +26,8 @@ class ScenePen {
 public:
     virtual ~ScenePen() = default;
 
-    // One line through the points, in a premultiplied colour, under the canvas's matrix and clip; in order
-    // with what was asked of the target's other canvases. Fewer than two points draw nothing.
+    // Draws one line through the points, in a premultiplied colour, with the canvas's matrix and clip, in
+    // order with the requests of other canvases on the same target. Fewer than two points draw nothing.
     virtual void DrawStroke(IMKPenCanvas& canvas, std::vector<InkPoint> const& points,
                             Vector4<float> const& color) = 0;
 };

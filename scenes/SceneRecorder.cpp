@@ -22,12 +22,12 @@ namespace {
 
 namespace fs = std::filesystem;
 
-// Two characters a value at least, so that neither the file's bytes nor its values become too many.
+// Limits bytes and values: each value takes at least two characters.
 constexpr std::size_t kMostText = 7u << 20;
-// Room for what is noted after the last operation.
+// Leaves room for operations that are added after the last one.
 constexpr long long kMostOperations = kMaxOperations - 8;
 
-// Whether all of it could be written; reason tells what not.
+// Writes a file. On failure returns false and sets *reason.
 bool WriteText(std::string const& path, std::string const& text, std::string* reason) {
     std::FILE* const file = std::fopen(path.c_str(), "wb");
     bool isWritten = file && std::fwrite(text.data(), 1, text.size(), file) == text.size();
@@ -49,7 +49,7 @@ RefPtr<SceneRecorder> SceneRecorder::Start(std::string const& path, IMKCanvas& c
 }
 
 RefPtr<SceneRecorder> SceneRecorder::Start(std::string const& path, int width, int height) {
-    // Without a target a canvas keeps its matrix and its saves, and draws nothing.
+    // A canvas without a target keeps its matrix and saves, and draws nothing.
     auto nowhere = RefPtr<IMKCanvas>::Adopt(new MKCanvas(nullptr, nullptr));
     return RefPtr<SceneRecorder>::Adopt(new SceneRecorder(path, std::move(nowhere), width, height));
 }
@@ -59,7 +59,7 @@ SceneRecorder::SceneRecorder(std::string const& path, RefPtr<IMKCanvas> canvas, 
     fs::path const file(path);
     mBitmaps =
         std::make_unique<RecordedBitmaps>(file.parent_path().string(), file.stem().string() + ".bitmaps");
-    // Now, and not when the drawing is lost.
+    // Writes an empty scene first, so that an unwritable path is reported now and not after drawing.
     std::string reason;
     if (!WriteText(path, GetText(), &reason)) Fail(reason);
 }
@@ -99,7 +99,7 @@ void SceneRecorder::Fail(std::string const& reason) {
     mFailure = reason;
     std::string const name = Log::ConvertSecureLog(String::FromFileName(mPath));
     __android_log_print(ANDROID_LOG_ERROR, "mok_log",
-                        "cannot record the scene %s: %s; the drawing goes on without", name.c_str(),
+                        "cannot record the scene %s: %s; drawing continues without it", name.c_str(),
                         reason.c_str());
 }
 
@@ -287,7 +287,7 @@ void SceneRecorder::DrawSimpleLine(PointF const& from, PointF const& to, MKPaint
     mCanvas->DrawSimpleLine(from, to, paint);
 }
 
-// A point without a second one is no line.
+// Drops an odd last point.
 void SceneRecorder::DrawSimpleLines(std::vector<PointF> const& points, MKPaint const* paint) {
     std::vector<PointF> const pairs(points.begin(), points.end() - static_cast<int>(points.size() % 2));
     Record(SceneLine("DrawSimpleLines").Add("points", pairs), paint);

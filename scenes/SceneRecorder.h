@@ -1,15 +1,17 @@
-// SceneRecorder: a canvas that writes what is drawn on it as a scene, and hands every call on to another canvas, or
-// to none. `moka draw` draws the same pixels from the scene:
+// SceneRecorder: a canvas that records its calls as a scene, and forwards them to another canvas, or to none.
+// `moka draw` draws the same pixels from the scene:
 //     auto recorder = SceneRecorder::Start("fault.json", *canvas);
 //     DrawPage(*recorder);   // instead of *canvas
 //     recorder->Close();     // fault.json, and its bitmaps in fault.bitmaps
-// Owner:  reference counted; holds the canvas. Its end closes it.
-// Thread: as the canvas, and where the bitmaps that are drawn may be read back: for caller-side ones any thread but
-//         the render thread.
-// Left out, and named in the scene by an operation "LeftOut": a drawable of the caller's own, numbers that are not
-//         finite, and what the caller names by LeaveOut(): foreign GL, or what other canvases draw on the target.
-// Fails:  what cannot be written (no such folder, a full disk, more than a scene may have) is one error line. The
-//         drawing goes on, the recording ends there, and Close() is false.
+// Owner:  reference counted; holds a reference on the canvas. The destructor calls Close().
+// Thread: a thread that may use the canvas and read the drawn bitmaps back: for caller-side bitmaps any
+//         thread except the render thread.
+// Not recorded, but marked in the scene by an operation "LeftOut": custom drawables of the application,
+// numbers that are
+//         not finite, and calls of LeaveOut(), for instance for external GL or other canvases on the same
+//         target.
+// Fails:  if the scene cannot be written (no such folder, a full disk, beyond the limits of a scene), logs an
+//         error. The recording ends, the calls are still forwarded, and Close() returns false.
 // Cost:   the text stays in memory until Close(); each draw of a bitmap reads it back.
 #pragma once
 
@@ -28,17 +30,18 @@ namespace Moka::Scenes {
 
 class SceneRecorder final : public IMKCanvas, public RefCount {
 public:
-    // The scene begins with what the canvas's bitmap holds and with its matrix. Begin before the canvas has clips
-    // and saves: they cannot be asked for. No checker: it has no matrix to tell.
+    // Starts a recording. The scene begins with the contents of the canvas's bitmap and with its matrix.
+    // Start it before the canvas has clips and saves, which cannot be queried. canvas must not be a checker,
+    // whose GetMatrix fails.
     static RefPtr<SceneRecorder> Start(std::string const& path, IMKCanvas& canvas);
-    // Draws nowhere; the scene begins transparent.
+    // Starts a recording without a canvas. The scene begins transparent.
     static RefPtr<SceneRecorder> Start(std::string const& path, int width, int height);
     ~SceneRecorder() override;
 
-    // Writes the scene; later calls are only handed on. False when the scene lacks something for another reason
-    // than being left out; error gets it, with the file.
+    // Writes the scene. Later calls are only forwarded. Returns false and sets *error if the recording
+    // failed; operations that were left out are no failure.
     bool Close(std::string* error = nullptr);
-    // Notes in the scene that something else was drawn here.
+    // Adds an operation "LeftOut" to the scene: something was drawn here that is not recorded.
     void LeaveOut(std::string const& what);
 
     void Clear(int argb) override;
@@ -91,7 +94,7 @@ private:
     SceneRecorder(std::string const& path, RefPtr<IMKCanvas> canvas, int width, int height);
 
     bool IsRecording() const { return mIsOpen && mFailure.empty(); }
-    // Nothing for a bitmap that canvases do not draw.
+    // Records nothing for a bitmap that canvases do not draw.
     void RecordBitmap(SceneLine line, IMKBitmap* bitmap, MKPaint const* paint);
     void Record(SceneLine line, MKPaint const* paint);
     void Record(SceneLine const& line);
@@ -106,7 +109,7 @@ private:
     int const mWidth;
     int const mHeight;
     std::unique_ptr<RecordedBitmaps> mBitmaps;
-    std::map<std::string, std::string> mPaints; // names by fields
+    std::map<std::string, std::string> mPaints; // from the fields of a paint to its name
     std::string mPaintText;
     std::string mOperations;
     long long mCount = 0;

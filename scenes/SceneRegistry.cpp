@@ -12,12 +12,12 @@ namespace Moka::Scenes {
 namespace {
 
 struct Entry {
-    char const* name; // of a file in data
+    char const* name; // the name of a file in data/
     SceneGroup group;
     bool alsoInStrips = false;
 };
 
-// In the gallery's order.
+// The scenes in the gallery's order.
 constexpr Entry kEntries[] = {
     {"note", SceneGroup::Note},
     {"rect-styles", SceneGroup::Rectangles},

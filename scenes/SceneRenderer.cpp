@@ -23,7 +23,7 @@ RefPtr<IMKBitmap> MakeTarget(Scene const& scene, IGLMsgQueue& queue) {
     return target;
 }
 
-// Strips are made on the render thread, which reports nothing: what has no texture now never gets one.
+// Throws if a strip has no texture. Strips are created on the render thread, which does not report failures.
 void CheckStrips(Scene const& scene, IMKBitmap& target, IGLMsgQueue& queue) {
     IMKTextureBitmap* const strips = target.GetTextureBitmap();
     if (!strips) return;
@@ -35,7 +35,7 @@ void CheckStrips(Scene const& scene, IMKBitmap& target, IGLMsgQueue& queue) {
     }
 }
 
-// The screen is read bottom row first.
+// A screen bitmap is read with its bottom row first.
 void FlipRows(Picture& picture) {
     for (int y = 0; y < picture.height / 2; ++y)
         std::swap_ranges(picture.At(0, y), picture.At(0, y) + picture.GetStride(),

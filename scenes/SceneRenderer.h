@@ -1,5 +1,5 @@
 // SceneRenderer.h: draws scenes on the GPU and reads them back.
-// Thread: any but the render thread, which reading back waits for.
+// Thread: any except the render thread, because reading back waits for it.
 #pragma once
 
 #include "scenes/Picture.h"
@@ -9,10 +9,10 @@
 
 namespace Moka::Scenes {
 
-// Bitmaps on the GPU, for canvases on any thread but the render thread.
+// Creates bitmaps on the GPU, for canvases on any thread except the render thread.
 class QueueStage final : public SceneStage {
 public:
-    // Both outlive the stage; the pen may be null.
+    // Both must outlive the stage. The pen may be null.
     explicit QueueStage(IGLMsgQueue& queue, ScenePen* pen = nullptr) : mQueue(queue), mPen(pen) {}
 
     IMKBitmap* MakeBitmap(Picture const& picture) override;
@@ -24,9 +24,9 @@ private:
     ScenePen* const mPen;
 };
 
-// A scene for the screen is drawn on the default frame buffer, which has to be as large as the scene. onDrawn
-// is called after the last draw, while the canvas and its programs exist.
-// Fails: throws SceneError when there is no room for the target or a bitmap.
+// Draws a scene and reads it back. A scene with onScreen is drawn on the default frame buffer, which must
+// have the scene's size. onDrawn is called after the last draw, while the canvas and its programs exist.
+// Fails: throws SceneError if memory for the target or a bitmap runs out.
 Picture RenderScene(Scene const& scene, IGLMsgQueue& queue, ScenePen* pen = nullptr,
                     std::function<void()> const& onDrawn = {});
 

@@ -1,6 +1,6 @@
-// SceneStage: what a scene needs besides a canvas: bitmaps that the canvas can draw, and for scenes that make
-// objects of the GPU, the queue, and ink.
-// Thread: one at a time, the one that draws the scene.
+// SceneStage: provides what a scene needs besides a canvas: bitmaps for the canvas, the queue for scenes that
+// create GPU objects, and the pen.
+// Thread: the thread that draws the scene.
 #pragma once
 
 namespace Moka {
@@ -19,14 +19,14 @@ class SceneStage {
 public:
     virtual ~SceneStage() = default;
 
-    // With one reference for the caller, given back with Unref(). The stage keeps a copy of the pixels if it
-    // needs them later. Null when there is no room.
+    // Creates a bitmap. The caller gets one reference. The stage copies the pixels if it needs them later.
+    // Returns null if memory runs out.
     virtual IMKBitmap* MakeBitmap(Picture const& picture) = 0;
 
-    // Null where there is no GPU; see Scene::needsGpu.
+    // The queue; null if there is no GPU. See Scene::needsGpu.
     virtual IGLMsgQueue* GetQueue() = 0;
 
-    // Null where nobody brought one; see Scene::needsPen.
+    // The pen; null if there is none. See Scene::needsPen.
     virtual ScenePen* GetPen() { return nullptr; }
 };
 

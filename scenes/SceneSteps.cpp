@@ -19,7 +19,8 @@ void CheckCount(long long count, SceneValue const& value) {
                                          " operations, repetitions and batches counted one by one");
 }
 
-// Moves, turns and scales what follows: the last comes first to a point, as with the canvas's Pre operations.
+// Translates, rotates and scales the following operations. As with the canvas's Pre functions, points are
+// scaled first.
 struct Placement {
     Placement() = default;
     explicit Placement(SceneFields& fields) {
@@ -89,7 +90,7 @@ SceneOperation ReadGroup(SceneFields& fields, SceneNames const& names) {
     if (SceneValue const* const value = fields.Find("repeat")) ReadRepeat(*value, *group);
     group->content = ReadSteps(fields.Get("operations"), names);
     return {[group](IMKCanvas& canvas, SceneBitmaps const& bitmaps) { group->Play(canvas, bitmaps); },
-            // What is empty takes time, too, when it is repeated.
+            // An empty group counts as well, because repeating it takes time.
             std::max(1LL, group->content.count) * group->repeat, group->content.needsGpu};
 }
 

@@ -1,4 +1,4 @@
-// SceneSteps.h: the operations of a scene, read once and checked, then played onto canvases.
+// SceneSteps.h: the operations of a scene. They are read and checked once, and can be drawn on any canvas.
 #pragma once
 
 #include "moka/base/RefPtr.h"
@@ -17,7 +17,7 @@ class IGLMsgQueue;
 
 namespace Moka::Scenes {
 
-// Everything a scene draws, with repetitions counted as often as they are drawn.
+// The most operations of a scene. Repetitions count as often as they are drawn.
 constexpr long long kMaxOperations = 1'000'000;
 
 struct SceneBitmaps : std::vector<RefPtr<IMKBitmap>> {
@@ -27,7 +27,7 @@ using SceneStep = std::function<void(IMKCanvas&, SceneBitmaps const&)>;
 
 struct SceneSteps {
     std::vector<SceneStep> steps;
-    long long count = 0;   // operations when played once
+    long long count = 0;   // the number of operations of one Play()
     bool needsGpu = false; // see Scene::needsGpu
 
     void Play(IMKCanvas& canvas, SceneBitmaps const& bitmaps) const {
@@ -35,13 +35,13 @@ struct SceneSteps {
     }
 };
 
-// What operations refer to by name.
+// The objects that operations refer to by name.
 struct SceneNames {
     NamedPaints paints;
     std::map<std::string, std::size_t> bitmaps; // position in SceneBitmaps
 };
 
-// A step and what it counts for.
+// A step, and the number of operations that it counts as.
 struct SceneOperation {
     SceneStep step;
     long long count = 1;
@@ -51,13 +51,13 @@ struct SceneOperation {
 using SceneOperationReader = SceneOperation (*)(SceneFields&, SceneNames const&);
 using SceneOperationTable = std::map<std::string, SceneOperationReader>;
 
-// By the names that the canvas gives them: what draws; what clears, clips, saves or sets the matrix. By names of
-// their own: custom drawables of the library, and what a recording could not say.
+// The operations by name. Drawing and state operations have the names of the canvas's functions. Drawable
+// operations are custom drawables of the library, and "LeftOut".
 SceneOperationTable const& GetDrawingOperations();
 SceneOperationTable const& GetDrawableOperations();
 SceneOperationTable const& GetStateOperations();
 
-// Of the field "paint", a new one without it; of the field key, which names a bitmap.
+// Return the paint of the field "paint", or a new one; and the bitmap that the field `key` names.
 MKPaint GetPaint(SceneFields& fields, SceneNames const& names);
 std::size_t GetBitmap(SceneFields& fields, SceneNames const& names, char const* key = "bitmap");
 

@@ -19,9 +19,9 @@ struct Place {
     int column = 0;
 };
 
-// The parser tells no places, so what it reads is followed here: where the last character is, and where the
-// value or key began that it belongs to. A text begins at its first quote, a number or a word at its first
-// character.
+// The JSON parser reports no positions. So this class follows its input: the position of the last character,
+// and the beginning of the value or key that it belongs to. A text begins at its first quote, a number or a
+// word at its first character.
 class Position {
 public:
     explicit Position(std::string_view text) : mAt(text.data()) {}
@@ -32,7 +32,7 @@ public:
 
     void Advance() {
         char const c = *mAt++;
-        // A line break belongs to the line that it ends.
+        // A line break counts as part of the line that it ends.
         if (mIsAfterBreak) mLast = {mLast.line + 1, 0};
         mIsAfterBreak = c == '\n';
         bool const isContinued = (static_cast<unsigned char>(c) & 0xC0) == 0x80; // within a UTF-8 character
@@ -78,7 +78,7 @@ public:
         mPosition->Advance();
         return *this;
     }
-    // Only ever compared with the end.
+    // The parser compares iterators with the end only.
     friend bool operator==(CountingIterator const& a, CountingIterator const&) {
         return a.mPosition->GetNext() == a.mEnd;
     }
@@ -107,7 +107,7 @@ public:
         Add(SceneValue::Kind::Text).text = std::move(value);
         return true;
     }
-    bool binary(binary_t&) override { return false; } // not in text
+    bool binary(binary_t&) override { return false; } // does not occur in JSON text
 
     bool start_object(std::size_t) override { return Open(SceneValue::Kind::Object); }
     bool start_array(std::size_t) override { return Open(SceneValue::Kind::List); }
@@ -123,12 +123,12 @@ public:
     }
 
     bool parse_error(std::size_t, std::string const&, nlohmann::json::exception const& error) override {
-        // What comes before is the parser's name of the error and its own count of lines.
+        // Drops the beginning, which is the parser's name of the error and its own position.
         std::string const text = error.what();
         std::size_t const syntax = text.find("syntax error");
         bool const isSyntax = syntax != std::string::npos;
         std::size_t const at = isSyntax ? syntax : std::min(text.size(), text.find("] ") + 2);
-        // What is too large is a number that has been read past its end.
+        // For a number that is too large, the parser has read beyond its end, so use its beginning.
         Throw(isSyntax ? mPosition.GetLast() : mPosition.GetToken(), "this is no JSON: " + text.substr(at));
     }
 
@@ -158,7 +158,8 @@ private:
         SceneValue& value = Add(kind);
         if (mOpen.size() == static_cast<std::size_t>(kMaxNesting))
             Throw(mPosition.GetToken(), "nested more than " + std::to_string(kMaxNesting) + " levels deep");
-        // Stays where it is while it is open: its neighbours come after it is closed.
+        // The address stays valid while the value is open, because items are added after it only when it is
+        // closed.
         mOpen.push_back(&value);
         return true;
     }

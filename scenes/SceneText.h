@@ -1,6 +1,6 @@
-// SceneText.h: JSON text as a tree in which every value knows its place.
-// Fails: throws SceneTextError on what is no JSON, a key given twice, numbers that are not finite in single
-//        precision, and on more than the limits below.
+// SceneText.h: reads JSON text as a tree of values with their positions.
+// Fails: throws SceneTextError for invalid JSON, duplicate keys, numbers that are not finite in single
+//        precision, and beyond the limits below.
 #pragma once
 
 #include <cstddef>
@@ -16,11 +16,11 @@ constexpr std::size_t kMaxValues = 4'000'000;
 struct SceneValue {
     enum class Kind { Null, Boolean, Number, Text, List, Object };
 
-    // For a message: the value itself where it is short.
+    // Returns a description for messages: the value itself if it is short.
     std::string Describe() const;
 
     Kind kind = Kind::Null;
-    int line = 0; // of its first character, both from 1; a column is a character
+    int line = 0; // of its first character; both count from 1, and columns are characters
     int column = 0;
     double number = 0; // of a boolean, 0 or 1
     std::string text;
@@ -30,7 +30,8 @@ struct SceneValue {
 
 SceneValue ParseSceneText(std::string_view text);
 
-// The way from root to a value in its tree: "operations[3].DrawRect.rect"; "the scene" for root itself.
+// Returns the path from root to a value in its tree: "operations[3].DrawRect.rect". For root itself, "the
+// scene".
 std::string FindPath(SceneValue const& root, SceneValue const& value);
 
 } // namespace Moka::Scenes

@@ -1,4 +1,4 @@
-// SceneTexts.h: the files of scenes/data, which the build puts into the library.
+// SceneTexts.h: the files of scenes/data, which the build embeds in the library.
 #pragma once
 
 #include <cstddef>

@@ -3,7 +3,7 @@
 namespace Moka::Scenes {
 namespace {
 
-// Each in the order of its numbers.
+// The names of each enumeration, in the order of its numbers.
 std::vector<std::string> const kClipOps{"Intersect", "Replace",    "Union",
                                         "Xor",       "Difference", "ReverseDifference"};
 std::vector<std::string> const kSaveFlags{"SaveAll", "SaveMatrix", "SaveClip"};

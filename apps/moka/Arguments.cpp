@@ -37,14 +37,14 @@ std::string CheckPath(std::string const& path) {
 
 std::string CheckFormat(std::string const& format) {
     bool const isKnown = std::find(std::begin(kFormats), std::end(kFormats), format) != std::end(kFormats);
-    return isKnown ? std::string() : "'" + format + "' is no format; use png, jpg, jpeg, webp or mki";
+    return isKnown ? std::string() : "'" + format + "' is not a format; use png, jpg, jpeg, webp or mki";
 }
 
 void MakeFolder(std::string const& folder) {
     std::error_code error;
     fs::create_directories(folder, error);
     if (!error && !fs::is_directory(folder)) error = std::make_error_code(std::errc::not_a_directory);
-    if (error) throw Failure("cannot make the folder " + folder + ": " + error.message());
+    if (error) throw Failure("cannot create the folder " + folder + ": " + error.message());
     CheckWritable(folder, folder);
 }
 
@@ -56,7 +56,7 @@ void CheckOutput(std::string const& output) {
     std::error_code error;
     fs::path const path(output);
     if (fs::is_directory(path, error)) throw Failure(output + " is a folder; name a file to write");
-    // Where a link leads is found out when saving.
+    // The target of a link is checked when the file is saved.
     if (fs::is_symlink(path, error)) return;
     std::string const folder = path.has_parent_path() ? path.parent_path().string() : ".";
     if (!fs::is_directory(folder, error))

@@ -1,4 +1,4 @@
-// Arguments.h: checks of arguments that are made in several places.
+// Arguments.h: checks of arguments that several commands use.
 #pragma once
 
 #include "apps/moka/Failure.h"
@@ -7,19 +7,19 @@
 
 namespace Moka::Tool {
 
-// Returns what is wrong, empty when nothing.
+// Returns an error message, or an empty text if the path is valid.
 std::string CheckPath(std::string const& path);
-// The same of a format's name, which is an extension.
+// The same for the name of a format, which is an extension.
 std::string CheckFormat(std::string const& format);
 
-// Makes the folder where it is missing, with those above it. Throws Failure unless files can be made in it.
+// Creates the folder and its parents if they are missing. Throws Failure if files cannot be created in it.
 void MakeFolder(std::string const& folder);
 
-// Before any work, so that nobody waits for what cannot be saved: throws Failure unless a file of this name
-// can be written and its extension says the format. "-" is well.
+// Throws Failure if a file of this name cannot be written or its extension is unknown. Call it before any
+// work, so that nobody waits for a result that cannot be saved. "-" is valid.
 void CheckOutput(std::string const& output);
 
-// What a picture of this name is saved with when nobody says: 90 as JPEG, else every pixel.
+// Returns the default quality for a file of this name: 90 for JPEG, else 100.
 int GetUsualQuality(std::string const& output);
 
 } // namespace Moka::Tool

@@ -33,17 +33,17 @@ class Batch;
 struct Job {
     Batch* batch = nullptr;
 
-    // What the other threads tell, under the batch's lock.
+    // The results of other threads, guarded by the batch's lock.
     News news = News::None;
     RefPtr<IMKBitmap> bitmap;
-    std::string reason; // why it could not be loaded, read back or saved; empty when it could
+    std::string reason; // why it could not be loaded, read back or saved; empty on success
 
     std::unique_ptr<unsigned char[]> pixels;    // read back
     std::optional<Interruption::Saving> saving; // from the request to its result
     std::string error;
 };
 
-// Of uploads, which are looked at by their textures.
+// Forgets errors of uploads, because their textures are checked instead.
 class ForgetErrors final : public ITask {
 public:
     explicit ForgetErrors(LogCollector& log) : mLog(log) {}
@@ -53,7 +53,8 @@ private:
     LogCollector& mLog;
 };
 
-// The reason in the library's line, which may not name the file: "cannot read image 'name': reason".
+// Returns the reason from the library's log line "cannot read image 'name': reason", in which the name may be
+// masked.
 std::string ReasonIn(std::string line) {
     std::size_t const end = line.rfind("': ");
     return end == std::string::npos ? line : line.erase(0, end + 3);
@@ -99,12 +100,12 @@ private:
     std::atomic<int> mConverted{0};
 
     std::mutex mMutex;
-    std::vector<Job*> mTold; // those with news, in their order; room for all, so that telling never fails
+    std::vector<Job*> mTold; // jobs with news, in order; has room for all jobs, so that adding never fails
 
     MessageLoop mLoop;
     Handler mHandler{OnNews, this};
     std::unique_ptr<RenderThread> mQueue;
-    std::optional<MKBitmapLoader> mLoader; // goes first: what it still calls needs the rest
+    std::optional<MKBitmapLoader> mLoader; // destroyed first: its callbacks use the other members
 };
 
 Batch::Batch(BatchRequest const& request, ConversionEnvironment const& env)
@@ -141,7 +142,7 @@ BatchResult Batch::Run() {
     BatchResult result;
     for (Job& job : mJobs)
         if (!job.error.empty()) result.errors.push_back(std::move(job.error));
-    if (mConverted == 0) rmdir(mRequest.folder.c_str()); // what is not empty stays
+    if (mConverted == 0) rmdir(mRequest.folder.c_str()); // fails if it is not empty
     result.seconds = std::chrono::duration<double>(std::chrono::steady_clock::now() - start).count();
     return result;
 }
@@ -157,7 +158,7 @@ void Batch::Drive() {
     if (mInFlight > 0) mLoop.Run();
 }
 
-// On the loader's thread or the render thread.
+// Runs on the loader's thread or the render thread.
 void Batch::Tell(Job& job, News news) {
     {
         std::lock_guard const lock(mMutex);
@@ -167,14 +168,14 @@ void Batch::Tell(Job& job, News news) {
     mHandler.SendMessage();
 }
 
-// The loader has logged the reason on this thread, one request after the other.
+// The loader has logged the reason on this thread before it called back.
 void Batch::TellWithReason(int id, News news) {
     Job& job = mJobs[static_cast<std::size_t>(id)];
     job.reason = ReasonIn(mEnv.log.TakeOwnError());
     Tell(job, news);
 }
 
-// An error since ForgetErrors is this job's, or that of an upload in between: better one failure too many than
+// An error since ForgetErrors belongs to this job, or to an upload in between. A wrong failure is better than
 // a file without its pixels.
 void Batch::OnRead(Rect const&, void*, void* userData) {
     Job& job = *static_cast<Job*>(userData);
@@ -262,7 +263,7 @@ void Batch::Save(Job& job) {
     if (!mLoader->RequestSave(IdOf(job), String::FromFileName(file.output), job.pixels.get(),
                               bitmap->GetWidth(), bitmap->GetHeight(), nullptr, mRequest.options.quality))
         throw Failure(file.input + ": not enough memory to save it");
-    static_cast<void>(job.pixels.release()); // the loader's now
+    static_cast<void>(job.pixels.release()); // the loader owns them
 }
 
 void Batch::FailJob(Job& job, std::string const& error) {

@@ -1,8 +1,8 @@
-// Batch: many images through the GPU, several at a time: the loader's thread decodes and encodes, the render
-// thread uploads and reads back, the calling thread drives them.
-// Thread:  once in a process, on a thread without a message loop. The loader's thread sleeps on afterwards.
-// Fails:   a file that cannot be converted stops no other; its output then is what it was before. Throws
-//          Failure when nothing can be converted at all. An interruption tells how many files were done.
+// Batch: converts many images through the GPU, several at a time. The loader's thread decodes and encodes,
+// the render thread uploads and reads back, and the calling thread controls them.
+// Thread:  once in a process, on a thread without a message loop. The loader's thread stays idle afterwards.
+// Fails:   a file that cannot be converted does not stop the others; its old output is kept. Throws Failure
+//          if no file can be converted. An interruption prints how many files were converted.
 // Memory:  no more than the given number of images, each in at most two copies.
 #pragma once
 
@@ -16,7 +16,7 @@ namespace Moka::Tool {
 
 struct BatchRequest {
     std::vector<BatchFile> files;
-    std::string folder; // made once there is a driver, and removed again when nothing came into it
+    std::string folder; // created after the driver is found, and removed again if no file was written
     ConversionOptions options;
     int inFlight = 1;
 };

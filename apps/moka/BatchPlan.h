@@ -1,4 +1,4 @@
-// BatchPlan: which file of many becomes which, settled before any work.
+// BatchPlan: determines the output file of each input, before any work.
 #pragma once
 
 #include <string>
@@ -11,8 +11,8 @@ struct BatchFile {
     std::string output;
 };
 
-// Each input's name, with format as its extension, in folder. Throws Failure when two inputs would become one
-// file.
+// The output has the input's name, with format as its extension, in folder. Throws Failure if two inputs
+// would have the same output.
 std::vector<BatchFile> PlanBatch(std::vector<std::string> const& inputs, std::string const& format,
                                  std::string const& folder);
 

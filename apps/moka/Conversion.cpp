@@ -20,13 +20,13 @@ namespace {
 
 using BitmapPtr = RefPtr<IMKBitmap>;
 
-// The queue has caught up, so what has no texture now never gets one.
+// Call this after the queue has caught up: a strip without a texture will never get one.
 void CheckUpload(IMKBitmap& bitmap, std::string const& name, LogCollector const& log) {
     log.ThrowError();
     CheckStrips(bitmap, name);
 }
 
-// The pixels, which are freed behind the upload.
+// Decodes the file into a bitmap. The pixels are freed after the upload.
 BitmapPtr Decode(ConversionRequest const& request, RenderThread& queue) {
     String const path = String::FromFileName(request.input.GetPath());
     ConversionOptions const& options = request.options;

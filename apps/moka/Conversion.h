@@ -1,6 +1,8 @@
-// Conversion: one image through the GPU: decoded, uploaded, shared, read back from the share, encoded.
-// Fails:   throws Failure; the output then is what it was before.
-// Memory:  the decoded pixels are gone before the read-back buffer is made; the GPU's copy before encoding.
+// Conversion: converts one image through the GPU: decodes, uploads, clones, reads the clone back, and
+// encodes.
+// Fails:   throws Failure; an old output file is kept.
+// Memory:  the decoded pixels are freed before the read-back buffer is allocated, and the GPU's copy before
+//          encoding.
 #pragma once
 
 #include "apps/moka/ConversionSteps.h"

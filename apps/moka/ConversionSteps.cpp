@@ -16,7 +16,7 @@
 namespace Moka::Tool {
 namespace {
 
-// An image is cut into strips of its whole width.
+// Explains the largest width: strips divide an image in height only.
 std::string TellLimit(ConversionOptions const& options, RenderThread const& queue) {
     std::string const largest = std::to_string(queue.GetContextInfo().maxTextureSize);
     return options.maxTextureSize > 0 ? "--max-texture " + largest + " limits the width, too"
@@ -34,7 +34,7 @@ ImageInfo ReadInfo(std::string const& path) {
 }
 
 std::unique_ptr<RenderThread> StartQueue(ConversionOptions const& options, ConversionEnvironment const& env) {
-    // There is no Java in this process.
+    // This process has no Java VM.
     MKBitmapFactory_UseNativeDecoder();
     RenderThreadOptions threadOptions;
     threadOptions.limits.maxTextureSize = options.maxTextureSize;
@@ -44,13 +44,13 @@ std::unique_ptr<RenderThread> StartQueue(ConversionOptions const& options, Conve
     if (options.width > queue->GetContextInfo().maxTextureSize)
         throw Failure("--size asks for " + std::to_string(options.width) + " pixels across; " +
                       TellLimit(options, *queue));
-    // What was tried in vain before a driver answered is no failure.
+    // Failed attempts before a driver was found are no error.
     env.log.Clear();
     env.progress.Tell(queue->GetContextInfo().renderer + ", " + queue->GetContextInfo().path);
     return queue;
 }
 
-// Height is cut into strips, width is not.
+// Strips divide an image in height, not in width.
 void CheckWidth(std::string const& input, ImageInfo const& info, ConversionOptions const& options,
                 RenderThread const& queue) {
     int const largest = queue.GetContextInfo().maxTextureSize;

@@ -1,4 +1,4 @@
-// ConversionSteps.h: what converting one file and converting many have in common.
+// ConversionSteps.h: the common parts of converting one file and converting many.
 // Fails: throws Failure.
 #pragma once
 
@@ -19,9 +19,9 @@ class LogCollector;
 class Progress;
 
 struct ConversionOptions {
-    int quality = 0;        // as BitmapFactory::SaveBitmap takes it
-    int maxTextureSize = 0; // 0 keeps the device's own
-    int width = 0;          // both 0 keeps the file's own size
+    int quality = 0;        // for BitmapFactory::SaveBitmap
+    int maxTextureSize = 0; // 0 keeps the device's limit
+    int width = 0;          // width and height 0 keep the file's own size
     int height = 0;
 };
 
@@ -33,14 +33,15 @@ struct ConversionEnvironment {
 
 ImageInfo ReadInfo(std::string const& path);
 
-// Also refuses a size that no texture of the device can be made for. Clears the log.
+// Starts the render thread and clears the log. Throws if the requested size is wider than the device's
+// largest texture.
 std::unique_ptr<RenderThread> StartQueue(ConversionOptions const& options, ConversionEnvironment const& env);
 
-// Refuses an image that is loaded in its own size and is wider than a texture may be.
+// Throws if an image that is loaded in its own size is wider than the largest texture.
 void CheckWidth(std::string const& input, ImageInfo const& info, ConversionOptions const& options,
                 RenderThread const& queue);
 
-// Once the queue has caught up: whether every strip of the bitmap is on the GPU.
+// Throws if a strip of the bitmap has no texture. Call it after the queue has caught up.
 void CheckStrips(IMKBitmap& bitmap, std::string const& input);
 
 } // namespace Moka::Tool

@@ -30,18 +30,19 @@ constexpr char kFooter[] =
     "One file into another:        moka convert photo.jpg page.mki\n"
     "Many files into a folder:     moka convert *.jpg --to mki --out pages\n"
     "Through a pipe:               moka convert - - --to webp <photo.jpg >photo.webp\n\n"
-    "The input's format follows from its content, the output's from its extension, or with --to from that;\n"
-    "standard output (-) gets a PNG unless --to says another.\n"
-    "An image is decoded, uploaded, read back and encoded. PNG, mki and WebP keep every pixel,\n"
-    "unless WebP is given a quality below 100; JPEG lays what is transparent on white.\n"
-    "Of many, each keeps its name but for the extension. One that cannot be converted stops no other; it is\n"
-    "named at the end, and the exit status is 1. An interruption leaves no unfinished file.";
+    "The content of the input determines its format. The extension of the output, or --to, determines the\n"
+    "format of the output; for standard output (-) the default is PNG.\n"
+    "An image is decoded, uploaded, read back and encoded. PNG, mki and WebP are lossless, except WebP with\n"
+    "a quality below 100. JPEG flattens transparency on white.\n"
+    "With many files, each output has the name of its input and the new extension. A file that cannot be\n"
+    "converted does not stop the others; it is named at the end, and the exit status is 1. An interruption\n"
+    "leaves no unfinished file.";
 
 struct ConvertOptions {
     std::string input;
-    std::vector<std::string> others; // the output, or with a format further inputs
-    std::string format;              // of many, or of standard output
-    std::string folder;              // empty: one file into another
+    std::vector<std::string> others; // the output, or further inputs if folder is set
+    std::string format;              // the format of many files, or of standard output
+    std::string folder;              // empty to convert one file
     int inFlight = kInFlight;
     ConversionOptions conversion;
     std::string size;
@@ -63,10 +64,10 @@ std::string CheckSize(std::string const& text) {
     int width = 0;
     int height = 0;
     if (ParseSize(text, width, height)) return {};
-    return "'" + text + "' is no size; write WIDTHxHEIGHT, each 1 to 65535, together within 1 GiB of pixels";
+    return "'" + text + "' is not a size; write WIDTHxHEIGHT, each 1 to 65535, at most 1 GiB of pixels";
 }
 
-// What stands before the driver's details: "llvmpipe (LLVM 15.0.6, 256 bits)".
+// Returns the renderer's name without its details: "llvmpipe" for "llvmpipe (LLVM 15.0.6, 256 bits)".
 std::string ShortName(std::string const& renderer) { return renderer.substr(0, renderer.find(" (")); }
 
 std::string Dimensions(ImageInfo const& info) {
@@ -85,7 +86,8 @@ void PrintSummary(ConversionRequest const& request, ConversionResult const& resu
         result.strips == 1 ? "" : "s", ShortName(result.renderer).c_str());
 }
 
-// In the words of the parser, which cannot know how many there may be.
+// Returns the output. The messages follow the parser's wording, which cannot check the number of files
+// itself.
 std::string TakeOutput(ConvertOptions const& options) {
     if (options.others.empty() && !options.format.empty())
         throw Failure(ExitStatus::Usage, "--to needs --out, a folder for the files, or - as the output");
@@ -105,7 +107,7 @@ ConversionOptions Complete(ConvertOptions const& options, std::string const& out
     return conversion;
 }
 
-// Off the terminal, and without unfinished files; what is told of the result is told afterwards.
+// Calls work with the log collected and interruptions handled. The result is printed afterwards.
 template <class Work>
 auto RunGuarded(ConvertOptions const& options, Work const& work) {
     Interruption interruption;
@@ -171,13 +173,12 @@ void AddFiles(CLI::App& command, ConvertOptions& options) {
     CLI::Option* const folder =
         command
             .add_option("--out", options.folder,
-                        "The folder to write many files to, made if need be; files there are replaced")
+                        "The folder to write many files to, created if missing; files there are replaced")
             ->type_name("DIR")
             ->check(CLI::Validator(CheckPath, ""));
     folder->needs(format);
     command
-        .add_option("--jobs", options.inFlight,
-                    "Of many files, at most N in memory at a time; 4 unless given, up to 64")
+        .add_option("--jobs", options.inFlight, "The number of files in memory at a time, 1 to 64; default 4")
         ->type_name("N")
         ->check(CLI::Range(1, kMaxInFlight).description(""))
         ->needs(folder);
@@ -186,7 +187,7 @@ void AddFiles(CLI::App& command, ConvertOptions& options) {
 void AddSettings(CLI::App& command, ConvertOptions& options) {
     command
         .add_option("--quality", options.quality,
-                    "0 to 100, of JPEG (90 unless given) and WebP (100, lossless, unless given)")
+                    "The quality of JPEG (default 90) and WebP (default 100, lossless), 0 to 100")
         ->type_name("N")
         ->check(CLI::Range(0, 100).description(""));
     command.add_option("--size", options.size, "Scale to exactly this size while decoding")
@@ -194,11 +195,11 @@ void AddSettings(CLI::App& command, ConvertOptions& options) {
         ->check(CLI::Validator(CheckSize, ""));
     command
         .add_option("--max-texture", options.conversion.maxTextureSize,
-                    "Use textures of at most N pixels a side; a taller image is cut into strips")
+                    "Use textures of at most N pixels a side; taller images are divided into strips")
         ->type_name("N")
         ->check(CLI::Range(1, BitmapFactory::kMaxSide).description(""));
-    command.add_flag("-q,--quiet", options.quiet, "Print nothing but errors");
-    command.add_flag("-v,--verbose", options.verbose, "Tell on stderr what happens, with the library's log");
+    command.add_flag("-q,--quiet", options.quiet, "Print only errors");
+    command.add_flag("-v,--verbose", options.verbose, "Print each step and the library's log to stderr");
 }
 
 } // namespace

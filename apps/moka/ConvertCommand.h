@@ -1,4 +1,4 @@
-// ConvertCommand: "moka convert": an image file, or many, into another format, through the GPU.
+// ConvertCommand: "moka convert" converts one or many image files to another format, through the GPU.
 #pragma once
 
 namespace CLI {

@@ -25,20 +25,20 @@
 namespace Moka::Tool {
 namespace {
 
-constexpr char kDescription[] = "Draw a scene, described in JSON, onto a picture";
+constexpr char kDescription[] = "Draw a scene from a JSON file to an image file";
 constexpr char kFooter[] =
     "    moka draw scene.json -o out.png            once\n"
     "    moka draw --watch scene.json -o out.png    again whenever the file changes\n\n"
     "    {\"size\": [320, 240], \"background\": \"#FFF0E8\", \"operations\": [\n"
     "        {\"DrawCircle\": {\"cx\": 160, \"cy\": 120, \"radius\": 80, \"paint\": "
     "{\"color\": \"#2050A0\"}}}]}\n\n"
-    "docs/scene-format.md describes the format; scenes/data has many more of them.";
+    "docs/scene-format.md describes the format; scenes/data has many examples.";
 
 struct DrawOptions {
     std::string input;
     std::string output;
-    std::string format; // of standard output
-    std::string trace;  // empty for none
+    std::string format; // the format of standard output
+    std::string trace;  // the trace file; empty for none
     bool statistics = false;
     bool watch = false;
     bool verbose = false;
@@ -52,7 +52,7 @@ Scenes::Scene Load(std::string const& path) {
     }
 }
 
-// A trace of one drawing. What goes wrong with it is told when the picture is there, which it spoils not.
+// The trace of one drawing. Errors of the trace are reported after the picture is written.
 class DrawTrace {
 public:
     explicit DrawTrace(std::string const& path) {
@@ -86,7 +86,7 @@ void PrintStatistics(RendererStatistics const& statistics) {
     }
 }
 
-// Draws once, on a render thread of its own.
+// Draws the scene once, with a new render thread.
 void Draw(DrawOptions const& options, Interruption& interruption) {
     DrawTrace trace(options.trace);
     OutputFile output(options.output, options.format.empty() ? "png" : options.format);
@@ -107,12 +107,12 @@ void Draw(DrawOptions const& options, Interruption& interruption) {
         std::printf("%s -> %s (%dx%d)\n", MakePrintable(options.input).c_str(),
                     MakePrintable(options.output).c_str(), picture.width, picture.height);
         if (options.statistics) PrintStatistics(statistics);
-        std::fflush(stdout); // whoever watches sees it at once
+        std::fflush(stdout); // so that a watching program sees it at once
     }
     trace.Finish();
 }
 
-// Until it is interrupted. A mistake is told, and the last picture stays.
+// Draws after each change, until it is interrupted. After an error in the scene, the last picture is kept.
 [[noreturn]] void DrawAgainAndAgain(DrawOptions const& options, Interruption& interruption) {
     for (FileWatch watch(options.input);; watch.WaitForChange()) {
         try {
@@ -127,17 +127,17 @@ void RunDraw(DrawOptions const& options) {
     CheckOutput(options.output);
     if (!options.format.empty() && !IsStandardStream(options.output))
         throw Failure(ExitStatus::Usage, "--to is for standard output (-o -); " + options.output +
-                                             " says its format by its extension");
+                                             " has its format by its extension");
     if (!options.trace.empty() && options.trace == options.output)
         throw Failure(ExitStatus::Usage, "the trace and the picture cannot both be " + options.output);
     if (IsStandardStream(options.trace))
-        throw Failure(ExitStatus::Usage, "--trace needs the name of a file; - is none");
+        throw Failure(ExitStatus::Usage, "--trace needs the name of a file, not -");
     if (options.statistics && IsStandardStream(options.output))
         throw Failure(ExitStatus::Usage,
                       "--statistics prints to standard output, where -o - sends the picture; name a file");
     bool const isStream = IsStandardStream(options.input) || IsStandardStream(options.output);
     if (options.watch && isStream)
-        throw Failure(ExitStatus::Usage, "--watch needs the names of two files; - is none");
+        throw Failure(ExitStatus::Usage, "--watch needs the names of two files, not -");
     if (options.watch && access(options.input.c_str(), R_OK) != 0)
         throw Failure("cannot read " + options.input + ": " + std::strerror(errno));
     Interruption interruption;
@@ -162,7 +162,7 @@ void AddDrawCommand(CLI::App& app) {
         ->type_name("OUTPUT")
         ->required()
         ->check(CLI::Validator(CheckPath, ""));
-    command->add_option("--to", options->format, "The format of standard output; png unless given")
+    command->add_option("--to", options->format, "The format of standard output; default png")
         ->type_name("FORMAT")
         ->check(CLI::Validator(CheckFormat, ""));
     command->add_flag("--statistics", options->statistics,
@@ -171,14 +171,12 @@ void AddDrawCommand(CLI::App& app) {
     command->add_flag("-w,--watch", options->watch,
                       "Draw again whenever the scene's file changes, until interrupted");
     command
-        ->add_option(
-            "--trace", options->trace,
-            "Write what each thread did, and when, for Perfetto or Chrome's about:tracing; replaced if it "
-            "exists")
+        ->add_option("--trace", options->trace,
+                     "Write a trace of all threads for Perfetto or Chrome's about:tracing; replaced if it "
+                     "exists")
         ->type_name("FILE")
         ->check(CLI::Validator(CheckPath, ""));
-    command->add_flag("-v,--verbose", options->verbose,
-                      "Tell on stderr what happens, with the library's log");
+    command->add_flag("-v,--verbose", options->verbose, "Print each step and the library's log to stderr");
     command->callback([options] { RunDraw(*options); });
 }
 

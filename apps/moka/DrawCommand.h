@@ -1,4 +1,4 @@
-// DrawCommand: "moka draw": a scene out of a JSON file onto a picture.
+// DrawCommand: "moka draw" draws a scene from a JSON file to an image file.
 #pragma once
 
 namespace CLI {

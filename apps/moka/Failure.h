@@ -1,4 +1,4 @@
-// Failure: what ends a command: one line for the person who typed it, and the exit status.
+// Failure: the exception that ends a command: a message of one line, and the exit status.
 #pragma once
 
 #include <stdexcept>
@@ -10,7 +10,7 @@ enum class ExitStatus { Failed = 1, Usage = 2 };
 
 class Failure : public std::runtime_error {
 public:
-    // An empty message has been told already.
+    // An empty message means that the error was printed already.
     Failure(ExitStatus status, std::string const& message)
         : std::runtime_error(message), mStatus(static_cast<int>(status)) {}
     explicit Failure(std::string const& message) : Failure(ExitStatus::Failed, message) {}
@@ -21,10 +21,10 @@ private:
     int mStatus;
 };
 
-// "cannot read image 'path': reason", or what else the library could not do; without a reason only that.
+// Returns "cannot <action> image 'path': reason", without the reason if it is empty.
 std::string TellCannot(char const* action, std::string const& path, std::string const& reason);
 
-// "moka: message" on stderr, as one line whatever is in it.
+// Prints "moka: message" to stderr as one line. Control characters are replaced.
 void PrintError(std::string const& message);
 
 } // namespace Moka::Tool

@@ -27,11 +27,11 @@ namespace fs = std::filesystem;
 
 using Scenes::Scene;
 
-constexpr char kDescription[] = "Draw every scene there is onto PNGs, and a page that shows them";
+constexpr char kDescription[] = "Draw all scenes to PNG files, and write a page that shows them";
 constexpr char kFooter[] =
     "    moka gallery --out gallery                 all, and gallery/index.html to open in a browser\n"
     "    moka gallery --out gallery --only clips    one of them\n"
-    "    moka gallery --list                        what there is; draws nothing";
+    "    moka gallery --list                        lists all scenes; draws nothing";
 
 struct GalleryOptions {
     std::string folder;
@@ -42,7 +42,7 @@ struct GalleryOptions {
 
 struct Gallery {
     std::vector<GalleryPicture> pictures;
-    std::vector<Scenes::Picture> pixels; // one for each
+    std::vector<Scenes::Picture> pixels; // one for each of pictures
     std::string device;
 };
 
@@ -69,7 +69,7 @@ std::vector<GalleryPicture> ChoosePictures(std::vector<std::string> const& only)
     return pictures;
 }
 
-// Each kind of target has a render thread of its own, one after the other.
+// Returns the options of the render thread for a picture. Each kind of target needs a different one.
 RenderThreadOptions OptionsFor(GalleryPicture const& picture) {
     RenderThreadOptions options;
     if (picture.isInStrips) options.limits.maxTextureSize = GetSideForThreeStrips(*picture.scene);
@@ -92,7 +92,7 @@ void DrawAll(Gallery& gallery, LogCollector& log, Progress& progress) {
         progress.SetStage(picture.scene->name.c_str());
         RenderThreadOptions const options = OptionsFor(picture);
         if (!queue || !IsSameTarget(options, current)) {
-            queue.reset(); // there may be one only
+            queue.reset(); // a process can have one render thread at a time
             queue = StartForScene(options, log);
             current = options;
         }
@@ -105,7 +105,7 @@ void DrawAll(Gallery& gallery, LogCollector& log, Progress& progress) {
     }
 }
 
-// Under its name only when it is whole. The other name is one that Interruption knows.
+// Writes the page to a temporary file and renames it. Interruption removes files with such a temporary name.
 void SavePage(std::string const& page, std::string const& folder, Interruption& interruption) {
     fs::path const path = fs::path(folder) / "index.html";
     fs::path const temporary = fs::path(folder) / ".index.html.galley.tmp";
@@ -129,18 +129,17 @@ void SaveAll(Gallery const& gallery, GalleryOptions const& options, Interruption
         OutputFile file(GetPath(options, gallery.pictures[i]), options.mki ? "mki" : "png");
         SavePicture(gallery.pixels[i], file, interruption);
     }
-    if (options.mki) return; // no browser shows them
+    if (options.mki) return; // browsers cannot show mki files
     SavePage(MakeGalleryPage(gallery.pictures, gallery.device), options.folder, interruption);
 }
 
 void PrintPath(fs::path const& path) { std::printf("%s\n", MakePrintable(path.string()).c_str()); }
 
-// Everything is drawn before anything is written, so that a failure leaves no half of a gallery.
+// Draws everything before it writes files, so that a failure leaves no incomplete gallery.
 void RunGallery(GalleryOptions const& options) {
     if (options.list) return PrintList();
     if (options.folder.empty())
-        throw Failure(ExitStatus::Usage,
-                      "name a folder with --out, or ask for --list; see moka gallery --help");
+        throw Failure(ExitStatus::Usage, "name a folder with --out, or give --list; see moka gallery --help");
     CheckNames(options.only);
     Gallery gallery;
     gallery.pictures = ChoosePictures(options.only);
@@ -166,14 +165,14 @@ void AddGalleryCommand(CLI::App& app) {
     command->footer(kFooter);
     command
         ->add_option("--out", options->folder,
-                     "The folder to write to, made if need be; pictures of the same names there are replaced")
+                     "The folder to write to, created if missing; pictures of the same names are replaced")
         ->type_name("DIR")
         ->check(CLI::Validator(CheckPath, ""));
     command->add_option("--only", options->only, "Only the scenes of these names")->type_name("NAME");
     command->add_flag(
         "--mki", options->mki,
         "Write mki files with the bytes that the GPU holds, to compare drivers; no PNG, no page");
-    command->add_flag("--list", options->list, "Tell the names, sizes and sentences of all scenes");
+    command->add_flag("--list", options->list, "Print the names, sizes and descriptions of all scenes");
     command->callback([options] { RunGallery(*options); });
 }
 

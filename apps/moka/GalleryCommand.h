@@ -1,4 +1,4 @@
-// GalleryCommand: "moka gallery": every scene of the registry as a picture, and a page that shows them.
+// GalleryCommand: "moka gallery" draws all scenes to image files and writes a page that shows them.
 #pragma once
 
 namespace CLI {

@@ -14,7 +14,7 @@ constexpr char kPage[] =
 #include "GalleryTemplate.inc"
     ;
 
-// Narrower pictures are shown enlarged, pixel by pixel.
+// Narrower pictures are shown enlarged by kZoom, without smoothing.
 constexpr int kSmallWidth = 160;
 constexpr int kZoom = 4;
 

@@ -1,4 +1,4 @@
-// GalleryPage.h: the contact sheet: one HTML page that needs nothing but the pictures beside it.
+// GalleryPage.h: makes the gallery's HTML page, which needs only the pictures in the same folder.
 #pragma once
 
 #include "scenes/Scene.h"
@@ -15,11 +15,12 @@ struct GalleryPicture {
     std::uint64_t drawRequests = 0;
     std::uint64_t drawCalls = 0;
 
-    // Of the picture and, with ".png", of its file.
+    // The name of the picture. Its file has this name and an extension.
     std::string GetName() const { return scene->name + (isInStrips ? "-in-strips" : ""); }
 };
 
-// The pictures in order, under a heading for each group. device tells what drew them.
+// Returns the page with the pictures in order, and a heading for each group. device is the name of the
+// driver.
 std::string MakeGalleryPage(std::vector<GalleryPicture> const& pictures, std::string const& device);
 
 } // namespace Moka::Tool

@@ -13,7 +13,7 @@ namespace {
 constexpr char kVertexShader[] = R"(#version 300 es
 uniform mat4 uMatrix;
 layout(location = 0) in vec2 aPosition;
-layout(location = 1) in vec2 aAcross; // from the middle, and the ink's radius there
+layout(location = 1) in vec2 aAcross; // the distance from the middle, and the ink's radius there
 out highp vec2 vAcross;
 void main() {
     vAcross = aAcross;
@@ -36,7 +36,7 @@ void Compile(GLuint program, GLenum stage, char const* source) {
     glShaderSource(shader, 1, &source, nullptr);
     glCompileShader(shader);
     glAttachShader(program, shader);
-    glDeleteShader(shader); // the program keeps it
+    glDeleteShader(shader); // GL keeps it while it is attached
 }
 
 void Link(GLuint program) {

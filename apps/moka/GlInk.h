@@ -1,5 +1,5 @@
-// GlInk: ink drawn with bare GL, by a program and a vertex array of its own. It shares nothing with the renderer
-// and cleans up nothing behind itself.
+// GlInk: draws ink with plain GL calls, with its own program and vertex array. It does not use the renderer
+// and does not restore GL state.
 // Thread: render thread.
 #pragma once
 
@@ -11,7 +11,7 @@
 
 namespace Moka::Tool {
 
-// How far from the middle of the ink, and the ink's radius there.
+// A vertex, with its distance from the middle of the ink, and the ink's radius there.
 struct InkVertex {
     float x, y;
     float across, radius;
@@ -19,13 +19,13 @@ struct InkVertex {
 
 class GlInk {
 public:
-    // Throws with the driver's text when it refuses the program.
+    // Throws an exception with the driver's text if the program does not compile.
     static std::unique_ptr<GlInk> Create();
-    ~GlInk(); // deletes its names, whatever is bound
+    ~GlInk(); // deletes its GL objects
     GlInk(GlInk const&) = delete;
     GlInk& operator=(GlInk const&) = delete;
 
-    // Draws a triangle strip in a premultiplied colour over what is there. It sets all that it depends on,
+    // Draws a triangle strip in a premultiplied colour, source-over. Sets all GL state that it depends on,
     // except target, viewport, clip and masks.
     void Draw(Matrix4<float> const& matrix, std::vector<InkVertex> const& strip,
               Vector4<float> const& color) const;

@@ -23,7 +23,7 @@ struct InfoOptions {
     bool verbose = false;
 };
 
-// What only some files have.
+// Describes properties that only some files have.
 std::string DescribeRest(ImageInfo const& info) {
     std::string text;
     if (!info.profile.empty()) text += ", profile " + info.profile;
@@ -66,10 +66,10 @@ void PrintDevice() {
                 info.path.c_str(), info.maxTextureSize);
 }
 
-// A broken file among many hides none of the others.
+// A broken file does not stop the others.
 void RunInfo(InfoOptions const& options) {
     if (options.files.empty() && !options.device)
-        throw Failure(ExitStatus::Usage, "name a file, or ask for --device; see moka info --help");
+        throw Failure(ExitStatus::Usage, "name a file, or give --device; see moka info --help");
     LogCollector const log(options.verbose);
     bool isAllRead = true;
     for (std::string const& file : options.files) isAllRead = PrintFile(file) && isAllRead;
@@ -81,13 +81,13 @@ void RunInfo(InfoOptions const& options) {
 
 void AddInfoCommand(CLI::App& app) {
     auto const options = std::make_shared<InfoOptions>();
-    CLI::App* const command =
-        app.add_subcommand("info", "Tell what images are: format, size, alpha, bytes on disk, bytes decoded, "
-                                   "colour profile, orientation, frames");
-    command->add_option("FILE", options->files, "The images to look at; - is standard input")
+    CLI::App* const command = app.add_subcommand(
+        "info", "Print the properties of images: format, size, alpha, bytes on disk, bytes decoded, "
+                "colour profile, orientation, frames");
+    command->add_option("FILE", options->files, "The images to read; - is standard input")
         ->check(CLI::Validator(CheckPath, ""));
     command->add_flag("--device", options->device,
-                      "Tell the GPU's driver, its largest texture and how it was reached");
+                      "Print the GPU's driver, its largest texture, and its EGL platform");
     command->add_flag("-v,--verbose", options->verbose, "Print the library's log to stderr");
     command->callback([options] { RunInfo(*options); });
 }

@@ -1,4 +1,4 @@
-// InfoCommand: "moka info": what image files say about themselves, and what the GPU's driver does.
+// InfoCommand: "moka info" prints the headers of image files, and the properties of the GPU's driver.
 #pragma once
 
 namespace CLI {

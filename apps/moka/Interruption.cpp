@@ -15,7 +15,7 @@
 namespace Moka::Tool {
 namespace {
 
-// Also wakes the watcher for its end.
+// The signal that makes the watcher end.
 constexpr int kWakeUp = SIGUSR1;
 constexpr auto kNextLook = std::chrono::milliseconds(2);
 
@@ -27,7 +27,7 @@ bool IsTemporary(std::string_view file, int descriptor) {
     return isNamedSo && (fcntl(descriptor, F_GETFL) & O_ACCMODE) == O_WRONLY;
 }
 
-// What is open stays open.
+// Makes all later opens fail. Open files stay open.
 void ForbidOpening() {
     rlimit files{};
     getrlimit(RLIMIT_NOFILE, &files);
@@ -71,7 +71,7 @@ void Interruption::Enter() {
 
 void Interruption::Leave() {
     std::lock_guard const lock(mMutex);
-    // Before whoever saved tells of a failure that is only ours.
+    // Ends the process before the saving code reports a failure that ForbidOpening has caused.
     if (--mSavings == 0 && mSignal) End();
 }
 
@@ -90,8 +90,8 @@ void Interruption::Watch() {
     }
 }
 
-// Whether there was one. When it has been renamed in this moment, there is nothing to remove and the file is
-// whole.
+// Removes the temporary file if one is open, and returns true. If it was renamed in this moment, there is
+// nothing to remove, and the file is complete.
 bool Interruption::RemoveOpenTemporary() const {
     if (!mOpenFiles) return false;
     rewinddir(mOpenFiles);
@@ -107,7 +107,7 @@ bool Interruption::RemoveOpenTemporary() const {
     return false;
 }
 
-// By the signal itself, so that a shell sees what happened.
+// Ends the process by the signal, so that a shell sees the reason.
 void Interruption::End() const {
     Progress::EraseLine();
     if (mLastWords) PrintError(mLastWords());

@@ -1,13 +1,13 @@
-// Interruption: lets SIGINT, SIGTERM and SIGHUP end the process at any moment without leaving an unfinished
-// file. The signals are blocked everywhere and waited for by one thread, which then keeps the process from
-// opening any more files. Outside every Saving scope there is nothing to remove and the process dies at once.
-// Inside one, the saving code has a temporary file (".name.xxxxxx.tmp") open: the watcher finds it among the
-// process's open files, removes it and dies. Or it has just closed it, to give it its real name, or was about
-// to make it, which now fails: the watcher looks again until there is one or the last scope has ended. So no
-// moment is missed, and no later save leaves anything. Without /proc the scopes end first, with whole files.
-// Owner:   one per process, made before any other thread, so that all inherit the blocked signals. Signals
-//          that the process was started with ignoring stay ignored.
-// Saving:  scopes may overlap, while one thread makes the files, one after the other.
+// Interruption: SIGINT, SIGTERM and SIGHUP end the process at any moment without leaving an unfinished file.
+// All threads block the signals. One thread, the watcher, waits for them and then prevents the process from
+// opening more files. Outside of all Saving scopes the process ends at once. Inside a scope there are two
+// cases. If the saving code has a temporary file (".name.xxxxxx.tmp") open, the watcher finds it among the
+// open files of the process, removes it and ends the process. If the saving code has just closed the file to
+// rename it, or was about to create it, which now fails, the watcher looks again until it finds a file or the
+// last scope has ended. Without /proc it waits for the scopes to end, with complete files.
+// Owner:   one per process, created before all other threads, so that they inherit the blocked signals.
+//          Signals that the process was started to ignore stay ignored.
+// Saving:  scopes may overlap, but only one thread writes files, one after the other.
 #pragma once
 
 #include <csignal>
@@ -26,7 +26,7 @@ public:
     Interruption(Interruption const&) = delete;
     Interruption& operator=(Interruption const&) = delete;
 
-    // From before the temporary file is made until the file has its real name, or there is none. Any thread.
+    // A scope from before the temporary file is created until it is renamed or removed. Any thread.
     class Saving {
     public:
         explicit Saving(Interruption& interruption) : mInterruption(interruption) { mInterruption.Enter(); }
@@ -38,8 +38,8 @@ public:
         Interruption& mInterruption;
     };
 
-    // What is told on stderr when a signal ends the process; an empty function tells nothing. It is called on
-    // any thread.
+    // Sets a function whose text is printed to stderr when a signal ends the process. It may be called on any
+    // thread. An empty function prints nothing.
     void SetLastWords(std::function<std::string()> lastWords);
 
 private:
@@ -51,10 +51,10 @@ private:
 
     sigset_t mSignals{};
     sigset_t mPreviousMask{};
-    DIR* const mOpenFiles; // opened in time; null without /proc
-    std::mutex mMutex;     // held while the process is ended, so that nothing is told or saved meanwhile
+    DIR* const mOpenFiles; // /proc/self/fd, opened in advance; null without /proc
+    std::mutex mMutex;     // held while the process ends, so that nothing is printed or saved meanwhile
     int mSavings = 0;
-    int mSignal = 0; // that ends the process
+    int mSignal = 0; // the signal that ends the process
     bool mDone = false;
     std::function<std::string()> mLastWords;
     std::thread mThread;

@@ -1,7 +1,7 @@
-// LogCollector: keeps the library's log off the terminal for its scope and turns its errors into a Failure.
-// The GPU's failures are error lines alone; so whoever used it asks here whether there was one. With several
-// files in work at once, a line belongs to the file that the thread which logged it was at.
-// Thread:  lines from any thread; asked by any.
+// LogCollector: collects the library's log for its scope, instead of printing it, and converts errors to
+// Failure. GPU errors are only logged, so commands check here whether there was one. If several files are
+// converted at once, the thread that logged a line determines its file.
+// Thread:  any.
 #pragma once
 
 #include "moka/base/log/LogSink.h"
@@ -15,23 +15,23 @@ namespace Moka::Tool {
 
 class LogCollector {
 public:
-    // With verbose every line is written to stderr as well, and names files.
+    // If verbose is true, every line is also printed to stderr, and log lines contain the names of files.
     explicit LogCollector(bool verbose);
     ~LogCollector();
     LogCollector(LogCollector const&) = delete;
     LogCollector& operator=(LogCollector const&) = delete;
 
-    // The first error since Clear(), which is the cause where others follow from it; empty without one.
+    // The first error since Clear(), because later ones may be consequences of it; empty if there is none.
     std::string GetError() const;
     void Clear();
 
-    // The first error that the calling thread logged, of the last few hundred; all of its errors are then
-    // forgotten. Allocates nothing.
+    // Returns the first error that the calling thread has logged, among the last few hundred, and removes all
+    // of its errors. Allocates nothing.
     std::string TakeOwnError();
 
     // Throws the first error, if there is one.
     void ThrowError() const;
-    // Throws the first error, or fallback when nothing was logged.
+    // Throws the first error, or fallback if there is none.
     [[noreturn]] void Throw(std::string const& fallback) const;
 
 private:

@@ -3,7 +3,7 @@
 namespace Moka::Tool {
 namespace {
 
-// The values in force, the outermost first.
+// The values of the enclosing lists, outermost first.
 using Scope = std::vector<PageValues const*>;
 
 std::string Escape(std::string const& text) {
@@ -29,7 +29,7 @@ std::string Escape(std::string const& text) {
     return escaped;
 }
 
-// The innermost one of this name.
+// Returns the innermost value of this name.
 template <class Map>
 typename Map::mapped_type const* Find(Scope const& scope, Map PageValues::*map, std::string const& name) {
     for (auto values = scope.rbegin(); values != scope.rend(); ++values) {

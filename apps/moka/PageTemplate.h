@@ -1,6 +1,8 @@
-// PageTemplate.h: a text with gaps, filled from values:
+// PageTemplate.h: replaces the placeholders of a template by values:
 //     {{name}}                the value, escaped for HTML
-//     {{#list}}...{{/list}}   once for each item of the list; names are looked up in the item, then around it
+//     {{#list}}...{{/list}}   repeated for each item of the list; names are looked up in the item, then in
+//     the
+//                             enclosing ones
 #pragma once
 
 #include <map>
@@ -15,7 +17,7 @@ struct PageValues {
     std::map<std::string, std::vector<PageValues>> lists;
 };
 
-// A name without a value is an empty text or list.
+// A name without a value is replaced by an empty text or list.
 std::string FillPage(std::string_view page, PageValues const& values);
 
 } // namespace Moka::Tool

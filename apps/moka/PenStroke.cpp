@@ -14,14 +14,14 @@ namespace {
 
 using Scenes::InkPoint;
 
-// Half of the feather lies outside the ink.
+// The ink's edge is soft over this distance on either side.
 constexpr float kFeather = 0.5f;
 
 struct Direction {
     float x, y;
 };
 
-// Of the line at this point, from the one before to the one after.
+// Returns the direction of the line at a point, from the previous point to the next.
 Direction DirectionAt(std::vector<InkPoint> const& points, std::size_t i) {
     InkPoint const& from = points[i == 0 ? 0 : i - 1];
     InkPoint const& to = points[std::min(i + 1, points.size() - 1)];
@@ -48,7 +48,7 @@ PenStroke::PenStroke(RenderThread& thread) : mThread(thread) {}
 
 PenStroke::~PenStroke() {
     mThread.Call([this] {
-        // Deleting takes them out of where they are bound.
+        // Deleting the objects unbinds them, which the renderer must know.
         RendererFactory::Flush();
         mInk.reset();
         RendererFactory::InvalidateState();

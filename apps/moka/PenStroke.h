@@ -1,8 +1,8 @@
-// PenStroke: ink drawn by GL code that knows nothing of the library's renderer, the way a pen engine does it:
-// a program, vertices and a vertex array of its own, between a pen canvas's two clip operations.
-// Owner:  its GL objects are made by the first stroke and deleted by the destructor, on the render thread.
-// Thread: any but the render thread, which every call waits for.
-// Fails:  a driver that refuses the program leaves one error line and no ink.
+// PenStroke: draws ink with external GL code, as a pen engine does: with its own program, vertices and vertex
+// array, between the two clip operations of a pen canvas.
+// Owner:  the first stroke creates the GL objects and the destructor deletes them, both on the render thread.
+// Thread: any except the render thread, because every call waits for it.
+// Fails:  if the program does not compile, logs an error and draws nothing.
 #pragma once
 
 #include "apps/moka/GlInk.h"
@@ -18,7 +18,7 @@ namespace Moka::Tool {
 
 class PenStroke final : public Scenes::ScenePen {
 public:
-    // The thread outlives this.
+    // The thread must outlive this object.
     explicit PenStroke(RenderThread& thread);
     ~PenStroke() override;
 

@@ -18,7 +18,7 @@ std::string DescribeCount(int done, int total, double seconds) {
         std::snprintf(text, sizeof(text), "convert  0/%d, %.1f s", total, seconds);
         return text;
     }
-    // The work grows with the files, as far as anybody knows.
+    // Estimates the remaining time from the number of files.
     long long const left = std::llround(seconds / done * (total - done));
     std::snprintf(text, sizeof(text), "convert  %d/%d  %d%%  %.1f files/s  %lld:%02lld left", done, total,
                   static_cast<int>(done * 100LL / total), done / seconds, left / 60, left % 60);

@@ -1,8 +1,8 @@
-// Progress: one line on the terminal that tells what is being done and for how long, for work that takes more
-// than a second; or, for many files, how many are done, how fast, and how long the rest will take. It is gone
-// when the work is done. Writes nothing where stderr is no terminal. Verbose instead, it tells on a line of its
-// own what has happened, and how long each stage took.
-// Thread:  made, told and destroyed by one thread; a thread of its own draws.
+// Progress: a line on the terminal for work that takes more than a second. It shows the stage and its
+// duration, or for many files the number of finished files, the rate, and the remaining time. It is erased at
+// the end. If stderr is not a terminal, nothing is printed. With Verbose it prints a line for each event, and
+// the duration of each stage, instead.
+// Thread:  created, updated and destroyed on one thread. Another thread prints.
 #pragma once
 
 #include <atomic>
@@ -22,19 +22,19 @@ public:
     Progress(Progress const&) = delete;
     Progress& operator=(Progress const&) = delete;
 
-    // A literal. The stage before it has ended.
+    // Ends the previous stage and begins a new one. stage must be a string literal.
     void SetStage(char const* stage);
 
-    // When verbose, "moka: what" on stderr.
+    // With Verbose, prints "moka: what" to stderr.
     void Tell(std::string const& what) const;
 
-    // From now on the line counts files instead.
+    // Makes the line show the number of files instead of the stage.
     void SetCount(int done, int total) {
         mDoneCount = done;
         mTotalCount = total;
     }
 
-    // Any thread.
+    // Erases the line. Any thread.
     static void EraseLine();
 
 private:

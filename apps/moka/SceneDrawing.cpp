@@ -20,7 +20,7 @@ std::unique_ptr<RenderThread> StartForScene(RenderThreadOptions const& options, 
     std::string error;
     std::unique_ptr<RenderThread> queue = RenderThread::Start(options, &error);
     if (!queue) throw Failure(error);
-    // What was tried in vain before a driver answered is no failure.
+    // Failed attempts before a driver was found are no error.
     log.Clear();
     return queue;
 }
@@ -45,7 +45,7 @@ Scenes::Picture DrawOnGpu(Scenes::Scene const& scene, RenderThread& queue, LogCo
 
 void SavePicture(Scenes::Picture const& picture, OutputFile& output, Interruption& interruption) {
     Bitmap image;
-    // Only read; the bitmap has no constant form.
+    // The cast is safe: the bitmap is only read.
     image.Construct(const_cast<unsigned char*>(picture.pixels.data()), picture.width, picture.height,
                     static_cast<int>(picture.GetStride()), Bitmap::kFormatRgba8888, false, false);
     std::string const path = output.GetPath();

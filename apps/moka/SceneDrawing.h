@@ -1,4 +1,4 @@
-// SceneDrawing.h: what drawing one scene and drawing the gallery have in common.
+// SceneDrawing.h: the common parts of drawing one scene and drawing the gallery.
 // Fails: throws Failure.
 #pragma once
 
@@ -14,14 +14,14 @@ class Interruption;
 class LogCollector;
 class OutputFile;
 
-// Clears the log.
+// Starts the render thread and clears the log.
 std::unique_ptr<RenderThread> StartForScene(RenderThreadOptions const& options, LogCollector& log);
 
-// statistics become the renderer's after the last draw.
+// Draws a scene and reads it back. Sets statistics to the renderer's after the last draw.
 Scenes::Picture DrawOnGpu(Scenes::Scene const& scene, RenderThread& queue, LogCollector const& log,
                           RendererStatistics& statistics);
 
-// In the format of the extension: JPEG at quality 90, the others with every pixel.
+// Saves the picture in the format of the extension: JPEG with quality 90, the others lossless.
 void SavePicture(Scenes::Picture const& picture, OutputFile& output, Interruption& interruption);
 
 } // namespace Moka::Tool

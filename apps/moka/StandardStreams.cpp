@@ -18,7 +18,7 @@ namespace {
 
 constexpr std::size_t kBlockBytes = 65536;
 
-// Encoding hardly ever enlarges.
+// Encoded images are rarely larger than decoded ones.
 constexpr std::uint64_t kMaxInputBytes = BitmapFactory::kMaxBytes + (std::uint64_t{64} << 20);
 
 std::string PathOf(int file) { return "/proc/self/fd/" + std::to_string(file); }
@@ -34,7 +34,8 @@ bool WriteAll(int file, char const* data, std::size_t count) {
     return true;
 }
 
-// Nobody can put a link there beforehand whose target would be written to.
+// Returns a random name, so that nobody can create a link of this name in advance, whose target would be
+// overwritten.
 std::string MakeSecret() {
     std::random_device random;
     std::string secret;
@@ -42,7 +43,7 @@ std::string MakeSecret() {
     return secret;
 }
 
-// Copies until the end. False with errno.
+// Copies until the end of the input. On failure returns false and sets errno.
 bool CopyAll(int from, int to, std::uint64_t limit) {
     std::vector<char> block(kBlockBytes);
     for (std::uint64_t total = 0;;) {

@@ -1,4 +1,4 @@
-// StandardStreams.h: "-" in place of a file's name: standard input or output.
+// StandardStreams.h: support for "-" as the name of standard input or output.
 // Fails: throws Failure.
 #pragma once
 
@@ -9,7 +9,7 @@ namespace Moka::Tool {
 
 inline bool IsStandardStream(std::string const& name) { return name == "-"; }
 
-// A file to read by its path. Of "-" the path leads to a copy in memory of all that standard input has.
+// A file to read by its path. For "-", the path refers to a copy of standard input in memory.
 class InputFile {
 public:
     explicit InputFile(std::string const& name);
@@ -18,9 +18,9 @@ public:
     InputFile& operator=(InputFile const&) = delete;
 
     std::string const& GetPath() const { return mPath; }
-    // For people.
+    // The name for messages.
     std::string const& GetName() const { return mName; }
-    // A message about the path, as one about the name.
+    // Replaces the path in a message by the name.
     std::string Explain(std::string const& message) const;
 
 private:
@@ -29,11 +29,11 @@ private:
     std::string mPath;
 };
 
-// A file to write by its path. Of "-" the path is a temporary one: Take() keeps what was saved there and removes
-// its name, Send() writes it to standard output. Of any other name both do nothing.
+// A file to write by its path. For "-", the path is a temporary one: Take() opens the saved file and removes
+// its name, and Send() writes it to standard output. For other names both do nothing.
 class OutputFile {
 public:
-    // format is the extension of what goes to standard output.
+    // format is the extension for standard output.
     OutputFile(std::string const& name, std::string const& format);
     ~OutputFile();
     OutputFile(OutputFile const&) = delete;
@@ -41,7 +41,7 @@ public:
 
     std::string const& GetPath() const { return mPath; }
     bool IsStream() const { return mIsStream; }
-    // Within the scope that guards the saving, so that an interruption leaves nothing.
+    // Call this inside the Saving scope, so that an interruption leaves no file.
     void Take();
     void Send() const;
 

@@ -5,11 +5,11 @@
 namespace Moka::Tool {
 
 std::string MakePrintable(std::string const& text, char substitute) {
-    std::string const utf8 = String(text).ToUtf8(); // what is malformed becomes U+FFFD
+    std::string const utf8 = String(text).ToUtf8(); // malformed sequences become U+FFFD
     std::string printable;
     for (std::size_t i = 0; i < utf8.size(); ++i) {
         auto const byte = static_cast<unsigned char>(utf8[i]);
-        // U+0080 to U+009F, which some terminals obey like the others.
+        // U+0080 to U+009F are control characters as well.
         bool const isLong = byte == 0xC2 && static_cast<unsigned char>(utf8[i + 1]) < 0xA0;
         bool const isControl = byte < ' ' || byte == 0x7F || isLong;
         printable.push_back(isControl ? substitute : utf8[i]);

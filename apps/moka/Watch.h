@@ -1,5 +1,5 @@
-// FileWatch: tells when a file has changed, by looking at its date, size and identity several times a second, which
-// works on every file system and with editors that replace a file instead of writing it.
+// FileWatch: waits for changes of a file, by checking its date, size and inode several times a second. This
+// works on every file system, and with editors that replace the file.
 #pragma once
 
 #include <cstdint>
@@ -12,8 +12,8 @@ class FileWatch {
 public:
     explicit FileWatch(std::string path) : mPath(std::move(path)), mLast(Look()) {}
 
-    // Returns when the file is another than at the last call, and has stayed so for a moment, so that nobody reads
-    // what is half written. While the file is missing it waits on.
+    // Returns when the file has changed since the last call, and has not changed again for a moment, so that
+    // it is not read while it is being written. If the file is missing, it keeps waiting.
     void WaitForChange();
 
 private:

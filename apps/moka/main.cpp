@@ -1,5 +1,5 @@
-// moka: the command-line tool. Exit status: 0 done, 1 failed, 2 wrong usage; every failure is one line on
-// stderr.
+// moka: the command-line tool. Exit status: 0 success, 1 failure, 2 wrong usage. Every failure prints one
+// line to stderr.
 #include "apps/moka/ConvertCommand.h"
 #include "apps/moka/DrawCommand.h"
 #include "apps/moka/Failure.h"
@@ -20,7 +20,7 @@ using Moka::Tool::ExitStatus;
 using Moka::Tool::Failure;
 
 constexpr char kDescription[] = "Tools of libMokaGraphics, the 2D GPU graphics library.";
-constexpr char kFooter[] = "'moka COMMAND --help' tells more. Exit status: 0 done, 1 failed, 2 wrong usage.";
+constexpr char kFooter[] = "See 'moka COMMAND --help'. Exit status: 0 success, 1 failure, 2 wrong usage.";
 
 std::string Explain(CLI::App const& app, CLI::ParseError const& error) {
     auto const commands = app.get_subcommands();
@@ -36,13 +36,13 @@ int Parse(CLI::App& app, int argc, char** argv) {
     try {
         app.parse(argc, argv);
     } catch (CLI::ParseError const& error) {
-        if (error.get_exit_code() == 0) return app.exit(error); // help and version are "errors" too
+        if (error.get_exit_code() == 0) return app.exit(error); // --help and --version throw as well
         throw Failure(ExitStatus::Usage, Explain(app, error));
     }
     return 0;
 }
 
-// Output that never arrived, on a full disk for instance, must not look like success.
+// Reports output that could not be written, for instance to a full disk.
 void FlushOutput() {
     if (std::fflush(stdout) != 0 || std::ferror(stdout)) throw Failure("cannot write to standard output");
 }
@@ -64,9 +64,10 @@ int Run(int argc, char** argv) {
 } // namespace
 
 int main(int argc, char** argv) {
-    // A file over the permitted size then fails to be written instead of ending the process half way.
+    // A file beyond the size limit then fails to be written, instead of ending the process.
     std::signal(SIGXFSZ, SIG_IGN);
-    // What the library says is collected where it matters. Its threads may say more while the process ends.
+    // Commands collect the library's log. Its threads may log more at process exit; print only errors of
+    // those.
     Moka::SetLogPriority(ANDROID_LOG_ERROR);
     try {
         return Run(argc, argv);

@@ -43,11 +43,23 @@ Document::Document(Callbacks callbacks, std::uint32_t autosaveMilliseconds)
           mHasUnsaved = true;
           mCallbacks.changed(splice);
       }),
-      mStore(mCallbacks.notify) {}
+      mThread(&Document::Work, this) {}
+
+Document::~Document() {
+    {
+        std::lock_guard<std::mutex> const lock(mMutex);
+        mIsEnding = true;
+        mChanged.notify_all();
+    }
+    mThread.join();
+}
 
 bool Document::Open(std::string const& path) {
-    if (!Close()) return false;
     std::string const full = fs::absolute(path).lexically_normal().string();
+    // Close drops the locks of other pages.
+    if (!Lock(full) || !Close() || !Lock(full)) return false;
+    mPath = full;
+    DropOtherLocks();
     PageStore::Opened opened = mStore.Open(full);
     mPage.Reset(std::move(opened.objects));
     mMustRename = !opened.problems.empty();
@@ -66,15 +78,31 @@ bool Document::Open(std::string const& path) {
     return true;
 }
 
+bool Document::Lock(std::string const& path) {
+    auto const lock = mLocks.try_emplace(path, path).first;
+    if (!lock->second.IsTaken()) return true;
+    mLocks.erase(lock);
+    mCallbacks.tell(path + " is open in another window; close it there, or choose another name", true);
+    return false;
+}
+
+void Document::DropOtherLocks() {
+    for (auto lock = mLocks.begin(); lock != mLocks.end();)
+        lock = lock->first == mPath ? std::next(lock) : mLocks.erase(lock);
+}
+
 bool Document::Save(std::string const* path) {
     std::string const to = path ? fs::absolute(*path).lexically_normal().string() : GetPath();
     if (mMustRename && to == GetPath()) {
         mCallbacks.tell(to + " was not read whole and is not replaced; save under another name", true);
         return false;
     }
+    if (!Lock(to)) return false;
     Autosave();
     mHasUnsaved = false; // until the report says otherwise
-    mStore.Save(mPage.GetObjects(), mPage.GetHeight(), to);
+    Run([this, objects = mPage.GetObjects(), height = mPage.GetHeight(), to] {
+        return mStore.Save(objects, height, to);
+    });
     return true;
 }
 
@@ -83,7 +111,9 @@ bool Document::Close() {
         Autosave();
     else if (mHasUnsaved)
         Save(nullptr);
-    mStore.Wait();
+    std::unique_lock<std::mutex> lock(mMutex);
+    mChanged.wait(lock, [this] { return mJobs.empty(); });
+    lock.unlock();
     return TakeReports();
 }
 
@@ -91,27 +121,41 @@ void Document::Autosave() {
     mIsTimed = false;
     if (mPending.empty()) return;
     auto const begin = std::chrono::steady_clock::now();
-    mStore.Append(std::exchange(mPending, {}));
+    Run([this, splices = std::exchange(mPending, {})] { return mStore.Append(splices); });
+    if (std::exchange(mIsJournalLong, false))
+        Run([this, objects = mPage.GetObjects()] { return mStore.Shorten(objects); });
     std::chrono::duration<double, std::milli> const passed = std::chrono::steady_clock::now() - begin;
     mCosts.longestHere = std::max(mCosts.longestHere, passed.count());
 }
 
 bool Document::TakeReports() {
+    std::vector<Report> reports;
+    {
+        std::lock_guard<std::mutex> const lock(mMutex);
+        reports.swap(mReports);
+    }
     bool isWell = true;
-    for (PageStore::Report const& report : mStore.TakeReports()) {
-        if (report.isSave) {
-            mCosts.longestSave = std::max(mCosts.longestSave, report.milliseconds);
-            if (report.hasFailed) mHasUnsaved = true;
-            if (!report.hasFailed) mMustRename = false;
-        } else if (report.bytes > 0) {
-            ++mCosts.autosaves;
-            mCosts.bytes += report.bytes;
-            mCosts.longestThere = std::max(mCosts.longestThere, report.milliseconds);
-        }
-        if (!report.message.empty()) mCallbacks.tell(report.message, report.hasFailed);
+    for (Report const& report : reports) {
+        Take(report);
         isWell = isWell && !report.hasFailed;
     }
+    if (!IsBusy()) DropOtherLocks();
     return isWell;
+}
+
+void Document::Take(Report const& report) {
+    if (report.isSave) {
+        mCosts.longestSave = std::max(mCosts.longestSave, report.milliseconds);
+        mHasUnsaved = mHasUnsaved || report.hasFailed;
+        mMustRename = mMustRename && report.hasFailed;
+        if (!report.hasFailed) mPath = report.path;
+    } else if (report.bytes > 0) {
+        ++mCosts.autosaves;
+        mCosts.bytes += report.bytes;
+        mCosts.longestThere = std::max(mCosts.longestThere, report.milliseconds);
+    }
+    mIsJournalLong = mIsJournalLong || report.isJournalLong;
+    if (!report.message.empty()) mCallbacks.tell(report.message, report.hasFailed);
 }
 
 int Document::Tick(std::uint32_t now) {
@@ -123,6 +167,38 @@ int Document::Tick(std::uint32_t now) {
     if (passed < mInterval) return static_cast<int>(mInterval - passed);
     Autosave();
     return -1;
+}
+
+void Document::Run(std::function<Report()> work) {
+    std::lock_guard<std::mutex> const lock(mMutex);
+    mJobs.push_back(std::move(work));
+    mChanged.notify_all();
+}
+
+bool Document::IsBusy() const {
+    std::lock_guard<std::mutex> const lock(mMutex);
+    return !mJobs.empty();
+}
+
+void Document::Work() {
+    std::unique_lock<std::mutex> lock(mMutex);
+    for (;;) {
+        mChanged.wait(lock, [this] { return mIsEnding || !mJobs.empty(); });
+        if (mJobs.empty()) return;
+        std::function<Report()> const job = mJobs.front();
+        lock.unlock();
+        auto const begin = std::chrono::steady_clock::now();
+        Report report = job();
+        std::chrono::duration<double, std::milli> const passed = std::chrono::steady_clock::now() - begin;
+        report.milliseconds = passed.count();
+        lock.lock();
+        mReports.push_back(std::move(report));
+        mJobs.pop_front();
+        mChanged.notify_all();
+        lock.unlock();
+        mCallbacks.notify();
+        lock.lock();
+    }
 }
 
 } // namespace Moka::Notebook

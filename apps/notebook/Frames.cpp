@@ -4,6 +4,20 @@
 
 #include <algorithm>
 #include <cstdio>
+#include <cstdlib>
+#include <new>
+
+static thread_local std::uint64_t tAllocations = 0;
+
+// All C++ code of the process comes here: the library, the application, and what a driver has of it.
+MOKA_API void* operator new(std::size_t size) {
+    ++tAllocations;
+    if (void* const memory = std::malloc(size > 0 ? size : 1)) return memory;
+    throw std::bad_alloc();
+}
+
+MOKA_API void operator delete(void* memory) noexcept { std::free(memory); }
+MOKA_API void operator delete(void* memory, std::size_t) noexcept { std::free(memory); }
 
 namespace Moka::Notebook {
 namespace {
@@ -11,6 +25,13 @@ namespace {
 constexpr double kMillisecond = 1e6;
 
 double ToMilliseconds(std::int64_t nanoseconds) { return static_cast<double>(nanoseconds) / kMillisecond; }
+
+void PrintTimes(char const* what, std::vector<double> times) {
+    if (times.empty()) return;
+    std::sort(times.begin(), times.end());
+    std::printf("%s: %zu, median %.1f ms, p99 %.1f ms, worst %.1f ms\n", what, times.size(),
+                times[times.size() / 2], times[times.size() * 99 / 100], times.back());
+}
 
 } // namespace
 
@@ -34,16 +55,10 @@ void Frames::Finish(std::int64_t begin, std::int64_t input) {
     std::int64_t const now = Trace::GetTime();
     Trace::NameTask("frame shown");
     if (input != 0) Trace::Add("notebook", "input to swap", input, now, nullptr, 0);
-    if (mShown.size() < mShown.capacity()) mShown.push_back({begin, input, now});
+    if (mShown.size() < mShown.capacity()) mShown.push_back({begin, input, now, tAllocations});
+    mLast = ToMilliseconds(now - begin);
     mIsInFlight = false;
     mNotify();
-}
-
-void Frames::PrintTimes(char const* what, std::vector<double> times) {
-    if (times.empty()) return;
-    std::sort(times.begin(), times.end());
-    std::printf("%s: %zu, median %.1f ms, p99 %.1f ms, worst %.1f ms\n", what, times.size(),
-                times[times.size() / 2], times[times.size() * 99 / 100], times.back());
 }
 
 void Frames::Print() const {
@@ -57,6 +72,11 @@ void Frames::Print() const {
     }
     PrintTimes("frames, from their beginning to the swap's end", std::move(frames));
     PrintTimes("input, from the event to the swap's end", std::move(inputs));
+    std::size_t const warm = mShown.size() / 2;
+    std::printf("allocations on the render thread: %llu in all, %llu in the last %zu frames\n",
+                static_cast<unsigned long long>(mShown.back().allocations),
+                static_cast<unsigned long long>(mShown.back().allocations - mShown[warm].allocations),
+                mShown.size() - 1 - warm);
 }
 
 } // namespace Moka::Notebook

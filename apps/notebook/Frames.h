@@ -1,4 +1,5 @@
-// Frames: when frames began, when they were shown, and which input they show: for the trace and --statistics.
+// Frames: when frames began, when they were shown, which input they show, and what the render thread allocated for
+// them: for the trace and --statistics.
 // Thread: the window's; the moment of showing is taken on the render thread, which allocates nothing for it.
 #pragma once
 
@@ -26,6 +27,8 @@ public:
     void End();
     // While it is, input is collected for the next frame: what is requested now would only wait.
     bool IsInFlight() const { return mIsInFlight; }
+    // The milliseconds from Begin to the end of the swap. No frame is in flight.
+    double GetLast() const { return mLast; }
     // Once the render thread has nothing more to do.
     void Print() const;
 
@@ -34,9 +37,9 @@ private:
         std::int64_t begin; // all in nanoseconds; input is 0 for none
         std::int64_t input;
         std::int64_t end;
+        std::uint64_t allocations; // of the render thread, from its start on
     };
     void Finish(std::int64_t begin, std::int64_t input);
-    static void PrintTimes(char const* what, std::vector<double> times);
 
     RenderThread& mQueue;
     std::function<void()> const mNotify;
@@ -44,6 +47,7 @@ private:
     std::int64_t const mStart = Trace::GetTime();
     std::int64_t mBegin = 0;
     std::int64_t mInput = 0;
+    double mLast = 0;
     std::vector<Shown> mShown; // the render thread's while it runs
 };
 

@@ -24,61 +24,49 @@ bool Images::Measure(std::string const& file, int& width, int& height, std::stri
     width = info.width;
     height = info.height;
     std::int64_t sum = std::int64_t{width} * height;
-    for (auto const& [other, pixels] : mPixels)
-        if (other != file) sum += pixels;
+    std::size_t count = 1;
+    for (auto const& [other, entry] : mEntries) {
+        if (other == file || entry.pixels == 0) continue;
+        sum += entry.pixels;
+        ++count;
+    }
     if (sum > Scenes::kMaxPicturePixels)
         reason = "the page's images would have more than " + std::to_string(Scenes::kMaxPicturePixels) +
                  " pixels together; make it smaller";
-    else if (mPixels.size() >= Scenes::kMaxBitmaps && mPixels.count(file) == 0)
+    else if (count > Scenes::kMaxBitmaps)
         reason = "a page has at most " + std::to_string(Scenes::kMaxBitmaps) + " different images";
-    if (!reason.empty()) return false;
-    mPixels[file] = std::int64_t{width} * height;
-    return true;
+    return reason.empty();
 }
 
-Images::Entry const* Images::Find(std::string const& file) const {
-    auto const found = mIndex.find(file);
-    return found == mIndex.end() ? nullptr : &mEntries[found->second];
-}
-
-Images::Entry& Images::Request(std::string const& file) {
-    mIndex[file] = mEntries.size();
-    mEntries.push_back({file, {}, false});
+void Images::Request(std::string const& file, Entry& entry) {
     int width = 0;
     int height = 0;
     std::string reason;
+    entry.request = ++mRequests;
+    ++mPending;
     bool const mayLoad = Measure(file, width, height, reason);
-    int const id = static_cast<int>(mEntries.size()) - 1;
-    if (mayLoad && mLoader->RequestLoad(id, String::FromFileName(file), &mQueue))
-        ++mPending;
-    else
-        mEntries.back().hasFailed = true;
-    return mEntries.back();
+    entry.pixels = mayLoad ? std::int64_t{width} * height : 0;
+    if (!mayLoad || !mLoader->RequestLoad(entry.request, String::FromFileName(file), &mQueue))
+        Receive(entry.request, nullptr);
 }
 
 IMKBitmap* Images::Get(std::string const& file) {
-    Entry const* const known = Find(file);
-    return (known ? *known : Request(file)).bitmap.Get();
+    auto const [at, isNew] = mEntries.try_emplace(file);
+    if (isNew) Request(file, at->second);
+    return at->second.bitmap.Get();
 }
 
 bool Images::HasFailed(std::string const& file) const {
-    Entry const* const entry = Find(file);
-    return entry && entry->hasFailed;
+    auto const at = mEntries.find(file);
+    return at != mEntries.end() && at->second.hasFailed;
 }
 
-// Entries stay: requests on their way have their numbers.
-void Images::Forget() {
-    mIndex.clear();
-    mPixels.clear();
-    for (Entry& entry : mEntries) entry.bitmap = {};
-}
-
-void Images::Receive(int id, IMKBitmap* bitmap) {
+void Images::Receive(int request, IMKBitmap* bitmap) {
     // As the page's file says it: an image is often drawn much smaller than it is.
     if (bitmap) bitmap->GetBitmapReadable()->SetTextureFilter(TextureFilterMipmapped);
     {
         std::lock_guard<std::mutex> const lock(mMutex);
-        mResults.push_back({id, RefPtr<IMKBitmap>::Share(bitmap)});
+        mResults.push_back({request, RefPtr<IMKBitmap>::Share(bitmap)});
     }
     mWake();
 }
@@ -91,11 +79,14 @@ std::vector<std::string> Images::Poll() {
     }
     std::vector<std::string> files;
     for (Result& result : results) {
-        Entry& entry = mEntries[static_cast<std::size_t>(result.id)];
-        entry.hasFailed = !result.bitmap;
-        entry.bitmap = std::move(result.bitmap);
-        files.push_back(entry.file);
         --mPending;
+        for (auto& [file, entry] : mEntries) {
+            if (entry.request != result.request) continue; // of a page that was left
+            entry.hasFailed = !result.bitmap;
+            entry.bitmap = std::move(result.bitmap);
+            files.push_back(file);
+            break;
+        }
     }
     return files;
 }

@@ -31,7 +31,7 @@ public:
     bool HasFailed(std::string const& file) const;
 
     // For another page: everything is loaded anew when it is asked for.
-    void Forget();
+    void Forget() { mEntries.clear(); }
 
     // Files that were loaded, or could not be, since the last call.
     std::vector<std::string> Poll();
@@ -39,24 +39,23 @@ public:
 
 private:
     struct Entry {
-        std::string file;
-        RefPtr<IMKBitmap> bitmap;
+        RefPtr<IMKBitmap> bitmap; // null while it is loaded
         bool hasFailed = false;
+        int request = 0;
+        std::int64_t pixels = 0;
     };
     struct Result {
-        int id;
+        int request;
         RefPtr<IMKBitmap> bitmap;
     };
 
-    Entry const* Find(std::string const& file) const;
-    Entry& Request(std::string const& file);
-    void Receive(int id, IMKBitmap* bitmap);
+    void Request(std::string const& file, Entry& entry);
+    void Receive(int request, IMKBitmap* bitmap);
 
     IGLMsgQueue& mQueue;
     std::function<void()> const mWake;
-    std::map<std::string, std::size_t> mIndex; // into mEntries
-    std::vector<Entry> mEntries;               // at the numbers of their requests
-    std::map<std::string, std::int64_t> mPixels;
+    std::map<std::string, Entry> mEntries; // by their files
+    int mRequests = 0;
     int mPending = 0;
     std::mutex mMutex;
     std::vector<Result> mResults;

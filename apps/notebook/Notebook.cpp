@@ -36,15 +36,13 @@ Notebook::Notebook(Options const& options, SDL_Window* window, RenderThread& que
                  [this] { Wake(); }},
                 static_cast<std::uint32_t>(options.autosave * 1000)),
       mImages(queue, [this] { Wake(); }),
-      mPainter(mDocument.GetPage(), mImages),
+      mPainter(mDocument.GetPage(), mImages, queue),
       mTools(mDocument.GetPage(), mPainter),
-      mTiles(queue, static_cast<std::size_t>(options.cache) << 20,
-             [this](IMKCanvas& canvas, RectF const& area) { return mPainter.Paint(canvas, area); }),
-      mInput(window, *this),
+      mTiles(queue, static_cast<std::size_t>(options.cache) << 20, mPainter),
       mRecorder(options.record),
       mFrames(queue, options.statistics, [this] { Wake(); }) {
     mView.top = Toolbar::kHeight;
-    Show();
+    FitWindow();
 }
 
 // Frames and images may still be on their way to members.
@@ -62,28 +60,34 @@ int Notebook::Run() {
     if (!mOptions.record.empty() && !mRecorder.IsOpen()) reason = "cannot write " + mOptions.record;
     if (reason.empty() && !mOptions.replay.empty()) mReplay.Load(mOptions.replay, reason);
     if (!reason.empty()) return std::fprintf(stderr, "moka-notebook: %s\n", reason.c_str()), 1;
-    mDocument.Open(mOptions.page.empty() ? Document::GetLastPath() : mOptions.page);
+    if (!mDocument.Open(mOptions.page.empty() ? Document::GetLastPath() : mOptions.page)) return 1;
     while (mIsRunning) {
-        Work();
-        if (mIsRunning && mIsDirty && !mFrames.IsInFlight()) DrawFrame();
+        int const wait = Work();
+        bool const isDue = mIsDirty && !mFrames.IsInFlight();
+        TakeInput(isDue ? 0 : wait);
+        if (!mIsRunning || !mIsDirty || mFrames.IsInFlight()) continue;
+        // What came while the last frame was on its way, to the last moment, belongs to this one.
+        if (mReplay.IsActive()) mReplay.Pump(false);
+        TakeInput(0);
+        if (mIsRunning) DrawFrame();
     }
     mQueue.WaitForTasks();
-    if (mOptions.statistics) {
-        mFrames.Print();
-        Document::Costs const& c = mDocument.GetCosts();
-        std::printf("objects: %zu, page %d rows, tiles %zu KiB, history %zu KiB\n",
-                    mDocument.GetPage().GetObjects().size(), mDocument.GetPage().GetHeight(),
-                    mTiles.CountBytes() / 1024, mDocument.GetPage().CountHistoryBytes() / 1024);
-        std::printf("autosaves: %d, %llu bytes, longest %.2f ms here and %.1f ms on the store's thread\n",
-                    c.autosaves, static_cast<unsigned long long>(c.bytes), c.longestHere, c.longestThere);
-        std::printf("longest save of the page: %.1f ms on the store's thread\n", c.longestSave);
-    }
+    if (mOptions.statistics) PrintStatistics();
     return mStatus;
 }
 
-// One round: what is due, then what came in. Waits only if there is nothing to draw.
-void Notebook::Work() {
-    std::uint32_t const now = SDL_GetTicks();
+void Notebook::PrintStatistics() const {
+    mFrames.Print();
+    Page const& page = mDocument.GetPage();
+    std::printf("objects: %zu, page %d rows, tiles %zu KiB, history %zu KiB\n", page.GetObjects().size(),
+                page.GetHeight(), mTiles.CountBytes() / 1024, page.CountHistoryBytes() / 1024);
+    Document::Costs const& c = mDocument.GetCosts();
+    std::printf("autosaves: %d, %llu bytes, longest %.2f ms here and %.1f ms on the document's thread\n",
+                c.autosaves, static_cast<unsigned long long>(c.bytes), c.longestHere, c.longestThere);
+    std::printf("longest save of the page: %.1f ms on the document's thread\n", c.longestSave);
+}
+
+void Notebook::TakeImages() {
     for (std::string const& file : mImages.Poll()) {
         for (ObjectPtr const& object : mDocument.GetPage().GetObjects()) {
             auto const* const image = std::get_if<Image>(&object->content);
@@ -92,13 +96,19 @@ void Notebook::Work() {
         if (mImages.HasFailed(file)) Tell("cannot read the image " + file + "; replace or delete it", true);
         mIsDirty = true;
     }
+}
+
+// Does what is due. Returns the milliseconds until more is, or -1.
+int Notebook::Work() {
+    std::uint32_t const now = SDL_GetTicks();
+    TakeImages();
     int wait = mDocument.Tick(now);
     auto const sooner = [&wait](int other) {
         wait = wait < 0 || (other >= 0 && other < wait) ? other : wait;
     };
     bool const isIdle =
         !mIsDirty && !mFrames.IsInFlight() && !mImages.IsBusy() && !mDocument.IsBusy() && !IsZooming();
-    if (mReplay.IsActive()) sooner(mReplay.Pump(mWindow, isIdle));
+    if (mReplay.IsActive()) sooner(mReplay.Pump(isIdle));
     if (IsZooming()) sooner(static_cast<int>(kZoomRest - std::min(kZoomRest, now - mZoomedAt)) + 1);
     if (!mMessage.empty() && !mIsError && now - mToldAt >= kMessageTime) {
         mMessage.clear();
@@ -106,20 +116,19 @@ void Notebook::Work() {
     } else if (!mMessage.empty() && !mIsError) {
         sooner(static_cast<int>(kMessageTime - (now - mToldAt)));
     }
-    WaitForInput(mIsDirty && !mFrames.IsInFlight() ? 0 : wait);
+    return wait;
 }
 
-void Notebook::WaitForInput(int milliseconds) {
+// Waits so long for the first event; forever if it is negative.
+void Notebook::TakeInput(int milliseconds) {
     SDL_Event event;
     bool const wasZooming = IsZooming();
-    bool hasEvent = milliseconds == 0  ? SDL_PollEvent(&event) != 0
-                    : milliseconds < 0 ? SDL_WaitEvent(&event) != 0
-                                       : SDL_WaitEventTimeout(&event, milliseconds) != 0;
+    bool hasEvent = SDL_WaitEventTimeout(&event, milliseconds) != 0;
     for (; hasEvent && mIsRunning; hasEvent = SDL_PollEvent(&event) != 0) {
         mRecorder.Add(event);
         bool const isInput = event.type >= SDL_KEYDOWN && event.type < SDL_CLIPBOARDUPDATE;
         if (isInput) mFrames.Mark(SDL_GetTicks() - std::min(SDL_GetTicks(), event.common.timestamp));
-        mInput.Handle(event);
+        Handle(event);
     }
     if (wasZooming && !IsZooming()) mIsDirty = true; // now sharp
 }
@@ -131,14 +140,14 @@ void Notebook::PageHasChanged(Splice const& splice) {
     bool const isOnTop =
         splice.removed.empty() && splice.at + splice.inserted.size() == page.GetObjects().size();
     if (isOnTop)
-        for (ObjectPtr const& object : splice.inserted)
-            mTiles.Add(object->bounds, [&](IMKCanvas& canvas) { mPainter.Draw(canvas, *object); });
+        for (ObjectPtr const& object : splice.inserted) mTiles.Add(object);
     else
         mTiles.Invalidate(splice.GetBounds());
     MoveView();
 }
 
-void Notebook::Show() {
+// The window has another size, or has to be drawn again.
+void Notebook::FitWindow() {
     int width = 1;
     int height = 1;
     SDL_GetWindowSize(mWindow, &width, &height);
@@ -161,7 +170,7 @@ void Notebook::DrawFrame() {
     Page const& page = mDocument.GetPage();
     IMKCanvas& canvas = *mScreen;
     canvas.ClearAll(static_cast<int>(kDesk));
-    bool const isDone = mTiles.Draw(canvas, mView, page.GetHeight(), IsZooming());
+    bool const isDone = mTiles.Draw(canvas, mView, page.GetHeight(), IsZooming(), mFrames.GetLast());
     canvas.Save(IMKCanvasBase::SaveAll);
     mView.Apply(canvas);
     mTools.Draw(canvas, mView.zoom, kAhead);

@@ -1,17 +1,16 @@
 // Notebook: the window: what comes in goes to the tools and the document, and what they say is drawn.
 // Owner:   main; the SDL window outlives it.
 // Thread:  the one that made the window.
+// Units:   the window's pixels; milliseconds as SDL's events have them. Pressure is 0 ... 1, -1 where it is unknown.
 #pragma once
 
 #include "apps/notebook/Document.h"
 #include "apps/notebook/Frames.h"
-#include "apps/notebook/Input.h"
 #include "apps/notebook/Replay.h"
 #include "apps/notebook/TileCache.h"
 #include "apps/notebook/Toolbar.h"
-#include "apps/notebook/Viewport.h"
-#include "moka/host/RenderThread.h"
 
+#include <map>
 #include <memory>
 #include <string>
 
@@ -29,7 +28,7 @@ struct Options {
     bool statistics = false;
 };
 
-class Notebook final : InputSink {
+class Notebook {
 public:
     Notebook(Options const& options, SDL_Window* window, RenderThread& queue);
     ~Notebook();
@@ -38,36 +37,43 @@ public:
     int Run();
 
 private:
-    void PenDown(float x, float y, std::uint32_t time, float pressure) override;
-    void PenMove(float x, float y, std::uint32_t time, float pressure) override;
-    void PenUp() override;
-    void PenCancel() override;
-    void Pan(float dx, float dy) override;
-    void Zoom(float x, float y, double factor) override;
-    void Key(SDL_Keycode key, bool isControl, bool isShift) override;
-    void Text(std::string const& text) override;
-    void Drop(std::string const& file, float x, float y) override;
-    void Show() override;
-    void Quit() override;
+    // What SDL's events mean: a pen (mouse or one finger), two fingers that pan and zoom, a wheel, keys, dropped
+    // files. The second finger takes back what the first one has begun.
+    void Handle(SDL_Event const& event);
+    void HandleButton(SDL_MouseButtonEvent const& button);
+    void HandleMotion(SDL_MouseMotionEvent const& motion);
+    void HandleFinger(SDL_TouchFingerEvent const& finger);
+    void MoveFingers(PointF const& before, PointF const& after, SDL_FingerID moved);
 
-    void KeyWithControl(SDL_Keycode key, bool isShift);
+    void PenDown(PointF const& at, std::uint32_t time, float pressure);
+    void PenUp(bool isKept);
+    void Pan(float dx, float dy);
+    void Zoom(PointF const& about, double factor);
+    void Key(SDL_Keycode key, bool isShift);
     void EditPrompt(SDL_Keycode key);
-    void Do(Command command);
+    void Do(Action const& action);
+    void DoWithFiles(Command command);
     void Ask(Command command, char const* question, std::string const& proposal);
     void Answer();
     void Export(bool isPage, std::string const& path);
+    void Paste();
+    void Drop(std::string const& file, PointF const& at);
     void Insert(std::string file, PointF at);
+    void Quit();
     void Tell(std::string const& message, bool isError);
     void PageHasChanged(Splice const& splice);
 
     void Wake() const;
-    void WaitForInput(int milliseconds);
-    void Work();
+    int Work();
+    void TakeInput(int milliseconds);
+    void TakeImages();
     bool IsZooming() const;
+    void FitWindow();
     void MoveView();
     void DrawFrame();
     void DrawMessage(IMKCanvas& canvas) const;
     std::string GetStatus() const;
+    void PrintStatistics() const;
 
     Options const mOptions;
     SDL_Window* const mWindow;
@@ -80,11 +86,16 @@ private:
     TileCache mTiles;
     Toolbar mToolbar;
     Viewport mView;
-    Input mInput;
     Recorder mRecorder;
     Replay mReplay;
     Frames mFrames;
     RefPtr<IMKCanvas> mScreen;
+
+    std::map<SDL_FingerID, PointF> mFingers;
+    PointF mMouse;
+    bool mIsPinching = false; // until the last finger is up
+    bool mIsPanning = false;  // with the middle button
+    bool mIsControl = false;  // the key is down
 
     std::string mMessage;
     bool mIsError = false;

@@ -9,12 +9,12 @@
 #include <cstdio>
 #include <filesystem>
 #include <nlohmann/json.hpp>
-#include <set>
 
 namespace Moka::Notebook {
 namespace {
 
 namespace fs = std::filesystem;
+using nlohmann::json;
 using Scenes::SceneFields;
 using Scenes::SceneValue;
 
@@ -23,48 +23,30 @@ constexpr char kPaper[] = "#FFFFFF";
 constexpr char kStart[] = "\"operations\": [\n";
 constexpr std::size_t kMaxProblems = 20;
 
-// Two decimals at most, none of them a closing zero.
-void AppendNumber(std::string& text, float value) {
-    char digits[48];
-    int length = std::snprintf(digits, sizeof(digits), "%.2f", static_cast<double>(value));
-    while (digits[length - 1] == '0') --length;
-    if (digits[length - 1] == '.') --length;
-    std::string_view const number(digits, static_cast<std::size_t>(length));
-    text += number == "-0" ? "0" : number;
-}
-
-std::string Quote(std::string const& text) { return nlohmann::json(text).dump(); }
-
 std::string NameFile(std::string const& file, std::string const& folder) {
     fs::path const relative = fs::path(file).lexically_relative(folder);
     bool const isInside = !relative.empty() && *relative.begin() != "..";
     return isInside ? relative.string() : file;
 }
 
-std::string WriteStroke(Stroke const& stroke) {
+// As few digits as tell hundredths apart.
+double ToHundredths(float value) { return std::round(static_cast<double>(value) * 100) / 100; }
+
+json WriteStroke(Stroke const& stroke) {
     char color[16];
     std::snprintf(color, sizeof(color), "#%08X", stroke.argb);
-    std::string text = "{\"DrawStroke\":{\"paint\":{\"color\":\"" + std::string(color) + "\"},\"points\":[";
-    for (InkPoint const& p : stroke.points) {
-        text += &p == &stroke.points.front() ? "[" : ",[";
-        AppendNumber(text, p.x);
-        text += ',';
-        AppendNumber(text, p.y);
-        text += ',';
-        AppendNumber(text, p.width);
-        text += ']';
-    }
-    return text += "]}}";
+    json::array_t points;
+    points.reserve(stroke.points.size());
+    for (InkPoint const& p : stroke.points)
+        points.push_back(json::array({ToHundredths(p.x), ToHundredths(p.y), ToHundredths(p.width)}));
+    return {{"DrawStroke", {{"paint", {{"color", color}}}, {"points", std::move(points)}}}};
 }
 
-std::string WriteImage(Image const& image, std::string const& folder) {
-    std::string text = "{\"DrawBitmap\":{\"bitmap\":" + Quote(NameFile(image.file, folder)) + ",\"dst\":[";
-    float const sides[4] = {image.place.left, image.place.top, image.place.right, image.place.bottom};
-    for (float const& side : sides) {
-        if (&side != sides) text += ',';
-        AppendNumber(text, side);
-    }
-    return text += "]}}";
+json WriteImage(Image const& image, std::string const& folder) {
+    RectF const& to = image.place;
+    json const place = json::array(
+        {ToHundredths(to.left), ToHundredths(to.top), ToHundredths(to.right), ToHundredths(to.bottom)});
+    return {{"DrawBitmap", {{"bitmap", NameFile(image.file, folder)}, {"dst", place}}}};
 }
 
 ObjectPtr ReadStroke(SceneFields& fields) {
@@ -196,15 +178,15 @@ private:
 
 bool IsWritablePath(std::string const& path) {
     try {
-        return !Quote(path).empty();
-    } catch (nlohmann::json::exception const&) {
+        return !json(path).dump().empty();
+    } catch (json::exception const&) {
         return false;
     }
 }
 
 std::string WriteOperation(Object const& object, std::string const& folder) {
     auto const* const stroke = std::get_if<Stroke>(&object.content);
-    return stroke ? WriteStroke(*stroke) : WriteImage(std::get<Image>(object.content), folder);
+    return (stroke ? WriteStroke(*stroke) : WriteImage(std::get<Image>(object.content), folder)).dump();
 }
 
 ObjectPtr ReadOperation(std::string_view text, std::string const& folder) {
@@ -212,17 +194,17 @@ ObjectPtr ReadOperation(std::string_view text, std::string const& folder) {
 }
 
 std::string WritePage(Objects const& objects, int height, std::string const& folder) {
-    std::string text = std::string("{\"about\": \"") + kAbout + "\",\n\"size\": [" +
-                       std::to_string(Page::kWidth) + ", " + std::to_string(height) +
-                       "],\n\"background\": \"" + kPaper + "\",\n\"bitmaps\": {";
-    std::set<std::string> files;
+    json bitmaps = json::object();
     for (ObjectPtr const& object : objects)
-        if (auto const* const image = std::get_if<Image>(&object->content))
-            files.insert(Quote(NameFile(image->file, folder)));
-    for (std::string const& file : files)
-        text += (&file == &*files.begin() ? "\n" : ",\n") + file + ": {\"file\": " + file +
-                ", \"filter\": \"Mipmapped\"}";
-    text += std::string("},\n") + kStart;
+        if (auto const* const image = std::get_if<Image>(&object->content)) {
+            std::string const name = NameFile(image->file, folder);
+            bitmaps[name] = {{"file", name}, {"filter", "Mipmapped"}};
+        }
+    json const head = {
+        {"about", kAbout}, {"size", {Page::kWidth, height}}, {"background", kPaper}, {"bitmaps", bitmaps}};
+    std::string text = head.dump();
+    text.back() = ',';
+    text += std::string("\n") + kStart;
     for (ObjectPtr const& object : objects) {
         text += WriteOperation(*object, folder);
         text += &object == &objects.back() ? "\n" : ",\n";

@@ -4,15 +4,20 @@
 #include "apps/notebook/SafeFile.h"
 #include "scenes/SceneError.h"
 
-#include <chrono>
+#include <cerrno>
 #include <cinttypes>
 #include <cstdio>
+#include <cstring>
 #include <filesystem>
 #include <string_view>
+#include <sys/socket.h>
+#include <sys/un.h>
 #include <unistd.h>
 
 namespace Moka::Notebook {
 namespace {
+
+constexpr std::uint64_t kShortJournal = std::uint64_t{4} << 20;
 
 namespace fs = std::filesystem;
 
@@ -76,64 +81,24 @@ std::string Replay(std::string_view& whole, std::string const& folder, Objects& 
 
 } // namespace
 
-struct PageStore::Files {
-    std::string path;
-    std::uint64_t fingerprint = 0; // of the page's file
-    bool hasJournal = false;
-    std::string waiting; // to be appended
-
-    Report Append(std::vector<Splice> const& splices) {
-        std::string const folder = GetFolder(path);
-        for (Splice const& splice : splices) waiting += WriteSplice(splice, folder);
-        Report report;
-        if (waiting.empty()) return report;
-        std::string const text = hasJournal ? waiting : MakeMark("continues", fingerprint) + waiting;
-        std::string const reason = AppendToFile(GetJournal(path), text);
-        if (!reason.empty())
-            return {true,
-                    false,
-                    "cannot autosave to " + GetJournal(path) + ": " + reason +
-                        "; make room: it stays in memory and is tried again",
-                    {}};
-        hasJournal = true;
-        waiting.clear();
-        report.bytes = text.size();
-        return report;
-    }
-
-    Report Save(Objects const& objects, int height, std::string const& to) {
-        std::string const text = WritePage(objects, height, GetFolder(to));
-        std::uint64_t const after = Fingerprint(text);
-        bool const isSame = to == path;
-        if (isSame && hasJournal) AppendToFile(GetJournal(path), MakeMark("saved", after));
-        std::string const reason = ReplaceFile(to, text);
-        if (!reason.empty())
-            return {true, true,
-                    "cannot save " + to + ": " + reason + "; make room, or save under another name", to};
-        if (hasJournal) unlink(GetJournal(path).c_str());
-        path = to;
-        fingerprint = after;
-        hasJournal = false;
-        waiting.clear();
-        return {false, true, "saved " + to, to};
-    }
-};
-
-PageStore::PageStore(std::function<void()> notify)
-    : mNotify(std::move(notify)), mFiles(new Files), mThread(&PageStore::Work, this) {}
-
-PageStore::~PageStore() {
-    {
-        std::lock_guard<std::mutex> const lock(mMutex);
-        mIsEnding = true;
-        mChanged.notify_all();
-    }
-    mThread.join();
+// A socket without a file: the system takes the name back when the process ends, however it ends.
+PageLock::PageLock(std::string const& path) : mSocket(socket(AF_UNIX, SOCK_DGRAM | SOCK_CLOEXEC, 0)) {
+    std::error_code ignored;
+    std::string const whole = fs::weakly_canonical(path, ignored).string();
+    sockaddr_un name{};
+    name.sun_family = AF_UNIX;
+    std::snprintf(name.sun_path + 1, sizeof(name.sun_path) - 1, "moka-notebook %016" PRIx64,
+                  Fingerprint(whole));
+    mIsTaken = bind(mSocket, reinterpret_cast<sockaddr*>(&name), sizeof(name)) != 0 && errno == EADDRINUSE;
 }
+
+PageLock::~PageLock() { close(mSocket); }
 
 PageStore::Opened PageStore::Open(std::string const& path) {
     mPath = path;
-    *mFiles = {path, Fingerprint({}), false, {}};
+    mFingerprint = Fingerprint({});
+    mWaiting.clear();
+    mJournalBytes = 0;
     Opened opened;
     std::string text;
     std::string reason;
@@ -141,8 +106,10 @@ PageStore::Opened PageStore::Open(std::string const& path) {
         PageText page = ReadPage(text, path, GetFolder(path));
         opened.objects = std::move(page.objects);
         opened.problems = std::move(page.problems);
-        mFiles->fingerprint = Fingerprint(text);
+        mFingerprint = Fingerprint(text);
     }
+    mPageObjects = opened.objects.size();
+    mWholeBytes = text.size();
     if (!reason.empty()) opened.problems.push_back("cannot read " + path + ": " + reason);
     std::string const journal = GetJournal(path);
     std::string splices;
@@ -153,9 +120,8 @@ PageStore::Opened PageStore::Open(std::string const& path) {
         return opened;
     }
     std::string_view rest = splices;
-    std::string const mark = MakeMark("continues", mFiles->fingerprint);
+    std::string const mark = MakeMark("continues", mFingerprint);
     if (rest.substr(0, mark.size()) == mark) {
-        mFiles->hasJournal = true;
         opened.hasUnsaved = true;
         rest.remove_prefix(mark.size());
         reason = Replay(rest, GetFolder(path), opened.objects);
@@ -163,7 +129,8 @@ PageStore::Opened PageStore::Open(std::string const& path) {
             opened.problems.push_back(journal + ": " + reason);
         else if (!rest.empty()) // or the next splice would be appended to a part of one
             fs::resize_file(journal, splices.size() - rest.size(), ignored);
-    } else if (splices.find(MakeMark("saved", mFiles->fingerprint)) != std::string::npos ||
+        mJournalBytes = splices.size() - rest.size();
+    } else if (splices.find(MakeMark("saved", mFingerprint)) != std::string::npos ||
                mark.rfind(splices, 0) == 0) {
         unlink(journal.c_str());
     } else {
@@ -175,60 +142,57 @@ PageStore::Opened PageStore::Open(std::string const& path) {
     return opened;
 }
 
-void PageStore::Append(std::vector<Splice> splices) {
-    Post([this, splices = std::move(splices)] { return mFiles->Append(splices); });
-}
-
-void PageStore::Save(Objects objects, int height, std::string const& path) {
-    Post([this, objects = std::move(objects), height, path] { return mFiles->Save(objects, height, path); });
-}
-
-bool PageStore::IsBusy() const {
-    std::lock_guard<std::mutex> const lock(mMutex);
-    return !mJobs.empty();
-}
-
-std::vector<PageStore::Report> PageStore::TakeReports() {
-    std::vector<Report> reports;
-    {
-        std::lock_guard<std::mutex> const lock(mMutex);
-        reports.swap(mReports);
+PageStore::Report PageStore::Append(std::vector<Splice> const& splices) {
+    for (Splice const& splice : splices) mWaiting += WriteSplice(splice, GetFolder(mPath));
+    Report report;
+    if (mWaiting.empty()) return report;
+    std::string const journal = GetJournal(mPath);
+    std::string const text = mJournalBytes > 0 ? mWaiting : MakeMark("continues", mFingerprint) + mWaiting;
+    std::string const reason = AppendToFile(journal, text);
+    if (!reason.empty()) {
+        report.hasFailed = true;
+        report.message = "cannot autosave to " + journal + ": " + reason +
+                         "; make room: it stays in memory and is tried again";
+        return report;
     }
-    for (Report const& report : reports)
-        if (report.isSave && !report.hasFailed) mPath = report.path;
-    return reports;
+    mWaiting.clear();
+    mJournalBytes += text.size();
+    report.bytes = text.size();
+    report.isJournalLong = mJournalBytes > kShortJournal + 2 * mWholeBytes;
+    return report;
 }
 
-void PageStore::Post(std::function<Report()> job) {
-    std::lock_guard<std::mutex> const lock(mMutex);
-    mJobs.push_back(std::move(job));
-    mChanged.notify_all();
+PageStore::Report PageStore::Shorten(Objects const& objects) {
+    Splice const all{0, Objects(mPageObjects), objects};
+    std::string const text = MakeMark("continues", mFingerprint) + WriteSplice(all, GetFolder(mPath));
+    Report report;
+    if (!ReplaceFile(GetJournal(mPath), text).empty()) return report; // the long one is as good
+    mWaiting.clear();
+    mJournalBytes = mWholeBytes = report.bytes = text.size();
+    return report;
 }
 
-void PageStore::Wait() {
-    std::unique_lock<std::mutex> lock(mMutex);
-    mChanged.wait(lock, [this] { return mJobs.empty(); });
-}
-
-void PageStore::Work() {
-    std::unique_lock<std::mutex> lock(mMutex);
-    for (;;) {
-        mChanged.wait(lock, [this] { return mIsEnding || !mJobs.empty(); });
-        if (mJobs.empty()) return;
-        std::function<Report()> const job = mJobs.front();
-        lock.unlock();
-        auto const begin = std::chrono::steady_clock::now();
-        Report report = job();
-        std::chrono::duration<double, std::milli> const passed = std::chrono::steady_clock::now() - begin;
-        report.milliseconds = passed.count();
-        lock.lock();
-        mReports.push_back(std::move(report));
-        mJobs.pop_front();
-        mChanged.notify_all();
-        lock.unlock();
-        mNotify();
-        lock.lock();
-    }
+PageStore::Report PageStore::Save(Objects const& objects, int height, std::string const& to) {
+    std::string const text = WritePage(objects, height, GetFolder(to));
+    std::uint64_t const after = Fingerprint(text);
+    if (to == mPath && mJournalBytes > 0) AppendToFile(GetJournal(mPath), MakeMark("saved", after));
+    std::string const reason = ReplaceFile(to, text);
+    Report report;
+    report.isSave = true;
+    report.path = to;
+    report.hasFailed = !reason.empty();
+    report.message = "saved " + to;
+    if (report.hasFailed)
+        report.message = "cannot save " + to + ": " + reason + "; make room, or save under another name";
+    if (report.hasFailed) return report;
+    if (mJournalBytes > 0) unlink(GetJournal(mPath).c_str());
+    mPath = to;
+    mFingerprint = after;
+    mPageObjects = objects.size();
+    mWholeBytes = text.size();
+    mJournalBytes = 0;
+    mWaiting.clear();
+    return report;
 }
 
 } // namespace Moka::Notebook

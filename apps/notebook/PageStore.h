@@ -1,7 +1,6 @@
-// PageStore: keeps a page on the disk. A save replaces the file at once, by a rename; between saves the splices are
-// appended to a journal beside it, NAME.journal, so that an autosave writes what has changed and no more.
-// Owner:   the application. Destruction finishes what was asked for.
-// Thread:  the calls on the window's; files are written on a thread of the store's own, in the order of the calls.
+// PageStore: a page on the disk. A save replaces the file at once, by a rename; between saves the splices are appended
+// to a journal beside it, NAME.journal, so that an autosave writes what has changed and no more.
+// Thread:  any, one at a time.
 // Crash:   after the process or the machine ends at any moment, Open gives what was there at the last Append or
 //          Save that had finished. A journal names the content that it continues, so one that is left behind by an
 //          interrupted save is not applied twice.
@@ -11,71 +10,59 @@
 
 #include "apps/notebook/Page.h"
 
-#include <condition_variable>
 #include <cstdint>
-#include <deque>
-#include <functional>
-#include <memory>
-#include <mutex>
 #include <string>
-#include <thread>
 #include <vector>
 
 namespace Moka::Notebook {
 
+// A page's name while a window has it, on this machine: the next window that asks finds it taken.
+class PageLock {
+public:
+    explicit PageLock(std::string const& path);
+    ~PageLock();
+    PageLock(PageLock const&) = delete;
+    PageLock& operator=(PageLock const&) = delete;
+
+    bool IsTaken() const { return mIsTaken; } // by another one
+
+private:
+    int const mSocket;
+    bool mIsTaken = false;
+};
+
 class PageStore {
 public:
-    // notify is called on the store's thread when TakeReports has something new.
-    explicit PageStore(std::function<void()> notify);
-    ~PageStore();
-    PageStore(PageStore const&) = delete;
-    PageStore& operator=(PageStore const&) = delete;
-
     struct Opened {
         Objects objects;
         std::vector<std::string> problems; // of the file or its journal: it must not be replaced
         bool hasUnsaved = false;           // the journal held something
     };
-    // A file that does not exist is an empty page. Call Wait first.
+    // A file that does not exist is an empty page.
     Opened Open(std::string const& path);
-    // The page's file. It changes when the report of a Save elsewhere is taken.
-    std::string const& GetPath() const { return mPath; }
-
-    void Append(std::vector<Splice> splices);
-    // Under a path that is not GetPath(), the page goes on there.
-    void Save(Objects objects, int height, std::string const& path);
-    // Other work with files, an export for instance, behind what was asked for.
-    struct Report;
-    void Run(std::function<Report()> work) { Post(std::move(work)); }
-    bool IsBusy() const;
-    // Until all that was asked for is done.
-    void Wait();
 
     struct Report {
         bool hasFailed = false;
+        std::string message{}; // empty for an autosave that went well
         bool isSave = false;
-        std::string message;     // empty for an autosave that went well
-        std::string path;        // of a save
-        std::uint64_t bytes = 0; // appended
-        double milliseconds = 0; // on the store's thread
+        std::string path{};      // of a save
+        std::uint64_t bytes = 0; // put into the journal
+        bool isJournalLong = false;
+        double milliseconds = 0; // of whoever measures
     };
-    std::vector<Report> TakeReports();
+    Report Append(std::vector<Splice> const& splices);
+    // Writes a journal that is longer than 4 MiB and twice the page anew: the page as it is, without the way there.
+    Report Shorten(Objects const& objects);
+    // Under another path the page goes on there.
+    Report Save(Objects const& objects, int height, std::string const& path);
 
 private:
-    struct Files; // of the page, on the store's thread
-
-    void Post(std::function<Report()> job);
-    void Work();
-
-    std::function<void()> const mNotify;
     std::string mPath;
-    std::unique_ptr<Files> mFiles;
-    mutable std::mutex mMutex;
-    std::condition_variable mChanged;
-    std::deque<std::function<Report()>> mJobs; // the first is being done
-    std::vector<Report> mReports;
-    bool mIsEnding = false;
-    std::thread mThread;
+    std::uint64_t mFingerprint = 0; // of the page's file
+    std::size_t mPageObjects = 0;   // in it
+    std::uint64_t mWholeBytes = 0;  // of the page when it was last written or read whole
+    std::uint64_t mJournalBytes = 0;
+    std::string mWaiting; // to be appended
 };
 
 } // namespace Moka::Notebook

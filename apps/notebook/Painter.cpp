@@ -9,10 +9,6 @@ MKPaint MakePaint(unsigned argb) {
     return paint;
 }
 
-RefPtr<MKStrokeDrawable> MakeInk(IGLMsgQueue& queue) {
-    return RefPtr<MKStrokeDrawable>::Adopt(new MKStrokeDrawable(&queue));
-}
-
 void AppendInk(MKStrokeDrawable& ink, InkPoints const& points, std::size_t from) {
     std::vector<MKStrokePoint> copy;
     copy.reserve(points.size() - from);
@@ -21,28 +17,25 @@ void AppendInk(MKStrokeDrawable& ink, InkPoints const& points, std::size_t from)
     ink.Append(copy.data(), static_cast<int>(copy.size()));
 }
 
-void DrawInk(IMKCanvas& canvas, InkPoints const& points, unsigned argb) {
-    auto const ink = MakeInk(*canvas.GetMsgQueue());
-    AppendInk(*ink, points, 0);
-    MKPaint const paint = MakePaint(argb);
-    canvas.Draw(ink.Get(), &paint);
-}
+Painter::Painter(Page const& page, Images& images, IGLMsgQueue& queue)
+    : mPage(page), mImages(images), mInk(RefPtr<MKStrokeDrawable>::Adopt(new MKStrokeDrawable(&queue))) {}
 
-std::size_t Painter::Paint(IMKCanvas& canvas, RectF const& area) const {
-    canvas.ClearAll(static_cast<int>(kPaper));
-    std::vector<std::size_t> const found = mPage.Find(area);
-    for (std::size_t const i : found) {
-        Object const& object = *mPage.GetObjects()[i];
-        if (mHidden.count(&object) == 0) Draw(canvas, object);
+Objects Painter::Find(RectF const& area) const {
+    Objects found;
+    for (std::size_t const i : mPage.Find(area)) {
+        ObjectPtr const& object = mPage.GetObjects()[i];
+        if (mHidden.count(object.get()) == 0) found.push_back(object);
     }
-    return found.size();
+    return found;
 }
 
 void Painter::Draw(IMKCanvas& canvas, Object const& object) const {
-    if (auto const* const stroke = std::get_if<Stroke>(&object.content))
-        DrawInk(canvas, stroke->points, stroke->argb);
-    else
-        DrawImage(canvas, std::get<Image>(object.content));
+    auto const* const stroke = std::get_if<Stroke>(&object.content);
+    if (!stroke) return DrawImage(canvas, std::get<Image>(object.content));
+    mInk->Clear();
+    AppendInk(*mInk, stroke->points, 0);
+    MKPaint const paint = MakePaint(stroke->argb);
+    canvas.Draw(mInk.Get(), &paint);
 }
 
 // A frame stands for an image that is not there yet, one with a cross for an image that cannot be read.

@@ -1,5 +1,7 @@
 // Painter: draws the page's objects onto canvases whose units are the page's pixels.
 // Thread: the window's; the drawing itself is posted.
+// Memory: the page holds the strokes; the GPU has one's points only while it is written or drawn onto a canvas. One
+//         drawable takes all of them in turn, so that the render thread allocates nothing for a stroke once warm.
 #pragma once
 
 #include "apps/notebook/Images.h"
@@ -13,23 +15,19 @@
 
 namespace Moka::Notebook {
 
+constexpr unsigned kPaper = 0xFFFFFFFF;
+
 MKPaint MakePaint(unsigned argb);
 
-// A stroke without points; those from `from` on are appended to it.
-RefPtr<MKStrokeDrawable> MakeInk(IGLMsgQueue& queue);
+// Appends the points from `from` on.
 void AppendInk(MKStrokeDrawable& ink, InkPoints const& points, std::size_t from);
-
-// The page holds the strokes; the GPU has their points only while they are drawn onto tiles.
-void DrawInk(IMKCanvas& canvas, InkPoints const& points, unsigned argb);
 
 class Painter {
 public:
-    static constexpr unsigned kPaper = 0xFFFFFFFF;
+    Painter(Page const& page, Images& images, IGLMsgQueue& queue);
 
-    Painter(Page const& page, Images& images) : mPage(page), mImages(images) {}
-
-    // Paper and objects of the area; returns how many objects. Hidden objects are left out.
-    std::size_t Paint(IMKCanvas& canvas, RectF const& area) const;
+    // Objects of the area, the lowest first, without those that are hidden.
+    Objects Find(RectF const& area) const;
     void Draw(IMKCanvas& canvas, Object const& object) const;
 
     void Hide(std::set<Object const*> objects) { mHidden = std::move(objects); }
@@ -39,6 +37,7 @@ private:
 
     Page const& mPage;
     Images& mImages;
+    RefPtr<MKStrokeDrawable> const mInk;
     std::set<Object const*> mHidden;
 };
 

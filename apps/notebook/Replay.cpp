@@ -1,114 +1,106 @@
 #include "apps/notebook/Replay.h"
 
+#include <algorithm>
 #include <cerrno>
+#include <cstddef>
 #include <cstring>
 #include <fstream>
 #include <sstream>
+#include <type_traits>
 
 namespace Moka::Notebook {
 namespace {
 
 constexpr char kIdle[] = "idle"; // waits until the window has nothing to do
-constexpr SDL_TouchID kTouch = 1;
 
-// Null for a word that is none.
+// A number of an event: where it stands, and its type.
+struct Field {
+    std::size_t at;
+    enum Type { None, Byte, Short, Int, Long, Float } type;
+};
+
 struct Word {
     char const* name;
     Uint32 type;
-};
-constexpr Word kWords[] = {
-    {"move", SDL_MOUSEMOTION},      {"press", SDL_MOUSEBUTTONDOWN},
-    {"release", SDL_MOUSEBUTTONUP}, {"wheel", SDL_MOUSEWHEEL},
-    {"key", SDL_KEYDOWN},           {"keyup", SDL_KEYUP},
-    {"text", SDL_TEXTINPUT},        {"finger-down", SDL_FINGERDOWN},
-    {"finger", SDL_FINGERMOTION},   {"finger-up", SDL_FINGERUP},
-    {"drop", SDL_DROPFILE},         {"quit", SDL_QUIT},
+    Field fields[4];
 };
 
-Word const* FindWord(std::string const& name) {
-    for (Word const& word : kWords)
-        if (name == word.name) return &word;
-    return nullptr;
+#define AT(member) offsetof(SDL_Event, member)
+constexpr Field kButton[] = {
+    {AT(button.x), Field::Int}, {AT(button.y), Field::Int}, {AT(button.button), Field::Byte}};
+constexpr Field kKey[] = {{AT(key.keysym.sym), Field::Int}, {AT(key.keysym.mod), Field::Short}};
+constexpr Field kFinger[] = {{AT(tfinger.fingerId), Field::Long},
+                             {AT(tfinger.x), Field::Float},
+                             {AT(tfinger.y), Field::Float},
+                             {AT(tfinger.pressure), Field::Float}};
+constexpr Word kWords[] = {
+    {"move",
+     SDL_MOUSEMOTION,
+     {{AT(motion.x), Field::Int}, {AT(motion.y), Field::Int}, {AT(motion.state), Field::Int}}},
+    {"press", SDL_MOUSEBUTTONDOWN, {kButton[0], kButton[1], kButton[2]}},
+    {"release", SDL_MOUSEBUTTONUP, {kButton[0], kButton[1], kButton[2]}},
+    {"wheel", SDL_MOUSEWHEEL, {{AT(wheel.preciseX), Field::Float}, {AT(wheel.preciseY), Field::Float}}},
+    {"key", SDL_KEYDOWN, {kKey[0], kKey[1]}},
+    {"keyup", SDL_KEYUP, {kKey[0], kKey[1]}},
+    {"text", SDL_TEXTINPUT, {}},
+    {"finger-down", SDL_FINGERDOWN, {kFinger[0], kFinger[1], kFinger[2], kFinger[3]}},
+    {"finger", SDL_FINGERMOTION, {kFinger[0], kFinger[1], kFinger[2], kFinger[3]}},
+    {"finger-up", SDL_FINGERUP, {kFinger[0], kFinger[1], kFinger[2], kFinger[3]}},
+    {"drop", SDL_DROPFILE, {}},
+    {"quit", SDL_QUIT, {}},
+};
+#undef AT
+
+// Null for a word that is none.
+template <class Matches>
+Word const* FindWord(Matches const& matches) {
+    auto const* const found = std::find_if(std::begin(kWords), std::end(kWords), matches);
+    return found == std::end(kWords) ? nullptr : found;
 }
 
-Word const* FindWord(Uint32 type) {
-    for (Word const& word : kWords)
-        if (type == word.type) return &word;
-    return nullptr;
+// Calls function with a reference to the field.
+template <class Function>
+void Visit(SDL_Event& event, Field const& field, Function const& function) {
+    void* const at = reinterpret_cast<char*>(&event) + field.at;
+    switch (field.type) {
+    case Field::Byte:
+        return function(*static_cast<Uint8*>(at));
+    case Field::Short:
+        return function(*static_cast<Uint16*>(at));
+    case Field::Int:
+        return function(*static_cast<Sint32*>(at));
+    case Field::Long:
+        return function(*static_cast<Sint64*>(at));
+    case Field::Float:
+        return function(*static_cast<float*>(at));
+    case Field::None:
+        return;
+    }
 }
 
 // What stands behind the word.
-std::string Describe(SDL_Event const& event) {
-    char text[256] = "";
-    auto const print = [&text](char const* format, auto... values) {
-        std::snprintf(text, sizeof(text), format, values...);
-    };
-    switch (event.type) {
-    case SDL_MOUSEMOTION:
-        print("%d %d %u", event.motion.x, event.motion.y, event.motion.state);
-        break;
-    case SDL_MOUSEBUTTONDOWN:
-    case SDL_MOUSEBUTTONUP:
-        print("%d %d %d", event.button.x, event.button.y, event.button.button);
-        break;
-    case SDL_MOUSEWHEEL:
-        print("%g %g", static_cast<double>(event.wheel.preciseX), static_cast<double>(event.wheel.preciseY));
-        break;
-    case SDL_KEYDOWN:
-    case SDL_KEYUP:
-        print("%d %d", event.key.keysym.sym, event.key.keysym.mod);
-        break;
-    case SDL_TEXTINPUT:
-        return event.text.text;
-    case SDL_FINGERDOWN:
-    case SDL_FINGERMOTION:
-    case SDL_FINGERUP:
-        print("%d %.6g %.6g %.4g", static_cast<int>(event.tfinger.fingerId),
-              static_cast<double>(event.tfinger.x), static_cast<double>(event.tfinger.y),
-              static_cast<double>(event.tfinger.pressure));
-        break;
-    case SDL_DROPFILE:
-        return event.drop.file ? event.drop.file : "";
-    default:
-        break;
-    }
-    return text;
+std::string Describe(Word const& word, SDL_Event event) {
+    if (event.type == SDL_TEXTINPUT) return event.text.text;
+    if (event.type == SDL_DROPFILE) return event.drop.file ? event.drop.file : "";
+    std::ostringstream out;
+    for (Field const& field : word.fields) Visit(event, field, [&out](auto value) { out << +value << ' '; });
+    return out.str();
 }
 
 // False if there are too few numbers.
-bool Fill(SDL_Event& event, std::string const& rest) {
-    std::istringstream in(rest);
-    int button = 0;
-    int id = 0;
-    int modifiers = 0;
-    switch (event.type) {
-    case SDL_MOUSEMOTION:
-        return !!(in >> event.motion.x >> event.motion.y >> event.motion.state);
-    case SDL_MOUSEBUTTONDOWN:
-    case SDL_MOUSEBUTTONUP:
-        in >> event.button.x >> event.button.y >> button;
-        event.button.button = static_cast<Uint8>(button);
-        return !in.fail();
-    case SDL_MOUSEWHEEL:
-        return !!(in >> event.wheel.preciseX >> event.wheel.preciseY);
-    case SDL_KEYDOWN:
-    case SDL_KEYUP:
-        in >> event.key.keysym.sym >> modifiers;
-        event.key.keysym.mod = static_cast<Uint16>(modifiers);
-        return !in.fail();
-    case SDL_TEXTINPUT:
+bool Fill(Word const& word, SDL_Event& event, std::string const& rest) {
+    event.type = word.type;
+    if (word.type == SDL_TEXTINPUT)
         std::snprintf(event.text.text, sizeof(event.text.text), "%s", rest.c_str());
-        return true;
-    case SDL_FINGERDOWN:
-    case SDL_FINGERMOTION:
-    case SDL_FINGERUP:
-        in >> id >> event.tfinger.x >> event.tfinger.y >> event.tfinger.pressure;
-        event.tfinger.touchId = kTouch;
-        event.tfinger.fingerId = id;
-        return !in.fail();
-    default:
-        return true;
+    std::istringstream in(rest);
+    for (Field const& field : word.fields) {
+        Visit(event, field, [&in](auto& value) {
+            auto number = +value;
+            in >> number;
+            value = static_cast<std::remove_reference_t<decltype(value)>>(number);
+        });
     }
+    return !in.fail();
 }
 
 } // namespace
@@ -116,10 +108,10 @@ bool Fill(SDL_Event& event, std::string const& rest) {
 Recorder::Recorder(std::string const& path) : mFile(path.empty() ? nullptr : std::fopen(path.c_str(), "w")) {}
 
 void Recorder::Add(SDL_Event const& event) {
-    Word const* const word = FindWord(event.type);
+    Word const* const word = FindWord([&](Word const& w) { return w.type == event.type; });
     if (!mFile || !word) return;
     std::fprintf(mFile.get(), "%u %s %s\n", event.common.timestamp - mStart, word->name,
-                 Describe(event).c_str());
+                 Describe(*word, event).c_str());
     std::fflush(mFile.get()); // a session that crashes is the one to replay
 }
 
@@ -131,50 +123,26 @@ bool Replay::Load(std::string const& path, std::string& reason) {
         if (text.empty() || text[0] == '#') continue;
         std::istringstream in(text);
         Line line;
-        in >> line.time >> line.word;
+        std::string name;
+        in >> line.time >> name;
         bool isGood = !in.fail();
         if (in.get() == ' ') std::getline(in, line.rest);
-        SDL_Event event{};
-        Word const* const word = FindWord(line.word);
-        if (word) event.type = word->type;
-        isGood = isGood && (word ? Fill(event, line.rest) : line.word == kIdle);
+        Word const* const word = FindWord([&](Word const& w) { return w.name == name; });
+        line.isIdle = name == kIdle;
+        isGood = isGood && (word ? Fill(*word, line.event, line.rest) : line.isIdle);
         if (!isGood) return reason = path + ':' + std::to_string(number) + ": no event: " + text, false;
         mLines.push_back(std::move(line));
     }
     return true;
 }
 
-bool Replay::MakeEvent(Line const& line, SDL_Window* window, SDL_Event& event) {
-    Word const* const word = FindWord(line.word);
-    if (!word) return false;
-    event.type = word->type;
-    Fill(event, line.rest);
-    Uint32 const id = SDL_GetWindowID(window);
-    switch (event.type) {
-    case SDL_DROPFILE:
-        event.drop.file = SDL_strdup(line.rest.c_str());
-        event.drop.windowID = id;
-        break;
-    case SDL_QUIT:
-        break;
-    case SDL_FINGERDOWN:
-    case SDL_FINGERMOTION:
-    case SDL_FINGERUP:
-        event.tfinger.windowID = id;
-        break;
-    default:
-        event.window.windowID = id; // at the same place in all the others
-    }
-    return true;
-}
-
-int Replay::Pump(SDL_Window* window, bool isIdle) {
+int Replay::Pump(bool isIdle) {
     std::uint32_t const now = SDL_GetTicks();
     if (!mIsStarted) mStart = now;
     mIsStarted = true;
     for (; IsActive(); ++mNext) {
         Line const& line = mLines[mNext];
-        if (line.word == kIdle) {
+        if (line.isIdle) {
             if (!isIdle) return 10;
             mStart = now - line.time;
             isIdle = false; // what follows may be something to do
@@ -182,9 +150,9 @@ int Replay::Pump(SDL_Window* window, bool isIdle) {
         }
         auto const wait = static_cast<std::int32_t>(mStart + line.time - now);
         if (wait > 0) return wait;
-        SDL_Event event{};
-        if (!MakeEvent(line, window, event)) continue;
+        SDL_Event event = line.event;
         event.common.timestamp = mStart + line.time;
+        if (event.type == SDL_DROPFILE) event.drop.file = SDL_strdup(line.rest.c_str());
         // Not SDL_PushEvent, which replaces the time.
         SDL_PeepEvents(&event, 1, SDL_ADDEVENT, event.type, event.type);
     }

@@ -35,16 +35,16 @@ public:
 
     // Hands over what is due. isIdle: all that was asked for is drawn, loaded and written. Returns the milliseconds
     // until more is due, or -1.
-    int Pump(SDL_Window* window, bool isIdle);
+    int Pump(bool isIdle);
     bool IsActive() const { return mNext < mLines.size(); }
 
 private:
     struct Line {
         std::uint32_t time = 0;
-        std::string word;
-        std::string rest;
+        SDL_Event event{};
+        bool isIdle = false;
+        std::string rest; // behind the word
     };
-    static bool MakeEvent(Line const& line, SDL_Window* window, SDL_Event& event);
 
     std::vector<Line> mLines;
     std::size_t mNext = 0;

@@ -1,15 +1,19 @@
-// Toolbar: the row of buttons above the page, drawn by the library.
+// Toolbar: the row of buttons above the page, drawn by the library, and what buttons and keys command.
 // Units: the window's pixels.
 #pragma once
 
 #include "apps/notebook/Tools.h"
 
+#include <string>
 #include <vector>
 
 namespace Moka::Notebook {
 
 enum class Command {
     None,
+    Choose, // a tool, by its number
+    SetColor,
+    SetWidth,
     Undo,
     Redo,
     Save,
@@ -17,10 +21,20 @@ enum class Command {
     Open,
     ExportView,
     ExportPage,
+    Paste,
     Delete,
-    ZoomIn,
-    ZoomOut,
-    ZoomOne
+    Escape,
+    Quit,
+    ZoomBy, // so many hundredths
+    ZoomOne,
+    ScrollAcross, // by so many pixels
+    ScrollDown,
+    ScrollPages // by so many tenths of what is seen
+};
+
+struct Action {
+    Command command = Command::None;
+    int value = 0;
 };
 
 class Toolbar {
@@ -29,24 +43,22 @@ public:
 
     Toolbar();
 
-    // Chooses a tool, a colour or a width itself; the rest is a command for the caller.
-    Command Press(float x, Tools& tools) const;
+    Action Find(float x) const;
     // status stands at the right.
     void Draw(IMKCanvas& canvas, int width, Tools const& tools, Page const& page,
               std::string const& status) const;
 
 private:
     struct Button {
-        enum Kind { ChooseTool, ChooseColor, ChooseWidth, GiveCommand } kind;
-        int value; // of the kind's enumeration, or an index
+        Action action; // a width's value is in tenths
         char const* label;
+        bool isIcon;
         float left;
         float width;
     };
 
-    void Add(Button::Kind kind, int value, char const* label, float width);
-    static void DrawIcon(IMKCanvas& canvas, Button const& button, bool isEnabled);
-    static bool IsChosen(Button const& button, Tools const& tools);
+    void Add(Action action, char const* label, bool isIcon, float width);
+    static bool IsChosen(Action const& action, Tools const& tools);
 
     std::vector<Button> mButtons;
     float mEnd = 8;

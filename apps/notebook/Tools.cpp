@@ -185,8 +185,8 @@ void Tools::DeleteSelected() {
 
 // Opaque ink may lie over itself, so only what is new goes to the GPU. Translucent ink is one stroke, tail and all.
 void Tools::DrawLive(IMKCanvas& canvas, float ahead) {
-    if (!mLive) mLive = MakeInk(*canvas.GetMsgQueue());
-    if (!mTail) mTail = MakeInk(*canvas.GetMsgQueue());
+    for (RefPtr<MKStrokeDrawable>* const ink : {&mLive, &mTail})
+        if (!*ink) *ink = RefPtr<MKStrokeDrawable>::Adopt(new MKStrokeDrawable(canvas.GetMsgQueue()));
     MKPaint const paint = MakePaint(GetInk());
     mTail->Clear();
     if (mTool == Tool::Highlighter) {

@@ -36,6 +36,7 @@ public:
 
     void Select(Objects objects) { mSelected = std::move(objects); }
     bool HasSelection() const { return !mSelected.empty(); }
+    RectF GetSelectedBounds() const;
     void DeleteSelected();
     // The selection while it is dragged, which the tiles do not show; where it was when the drag began.
     bool IsDragging() const { return mDrag != Drag::None; }
@@ -51,7 +52,6 @@ private:
     bool BeginDrag(PointF at, double zoom);
     void SelectInside();
     void EndDrag();
-    RectF GetSelectedBounds() const;
     Placement GetPlacement() const;
     unsigned GetInk() const;
     void DrawLive(IMKCanvas& canvas, float ahead);

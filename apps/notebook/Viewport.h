@@ -23,13 +23,13 @@ struct Viewport {
     int height = 1; // of the view, below the toolbar
     int top = 0;    // the toolbar's height
 
-    PointF ToPage(float wx, float wy) const {
-        return {static_cast<float>((static_cast<double>(wx) + x) / zoom),
-                static_cast<float>((static_cast<double>(wy) - top + y) / zoom)};
+    PointF ToPage(PointF const& at) const {
+        return {static_cast<float>((static_cast<double>(at.x) + x) / zoom),
+                static_cast<float>((static_cast<double>(at.y) - top + y) / zoom)};
     }
     RectF GetPageArea() const {
-        PointF const from = ToPage(0, static_cast<float>(top));
-        PointF const to = ToPage(static_cast<float>(width), static_cast<float>(top + height));
+        PointF const from = ToPage({0, static_cast<float>(top)});
+        PointF const to = ToPage({static_cast<float>(width), static_cast<float>(top + height)});
         return {from.x, from.y, to.x, to.y};
     }
     int Scale(int page) const { return static_cast<int>(std::ceil(page * zoom)); }
@@ -44,15 +44,16 @@ struct Viewport {
         x -= static_cast<int>(std::lround(dx));
         y -= static_cast<int>(std::lround(dy));
     }
-    // What is at (wx, wy) stays there.
-    void ZoomAt(float wx, float wy, double factor) {
+    // What is there stays there.
+    void ZoomAt(PointF const& at, double factor) {
         double const before = zoom;
         zoom = std::clamp(zoom * factor, kMinZoom, kMaxZoom);
         if (std::abs(zoom - 1) < 0.02) zoom = 1;
         double const ratio = zoom / before;
-        x = static_cast<int>(std::lround((x + static_cast<double>(wx)) * ratio - static_cast<double>(wx)));
-        double const inView = static_cast<double>(wy) - top;
-        y = static_cast<int>(std::lround((y + inView) * ratio - inView));
+        double const across = static_cast<double>(at.x);
+        double const down = static_cast<double>(at.y) - top;
+        x = static_cast<int>(std::lround((x + across) * ratio - across));
+        y = static_cast<int>(std::lround((y + down) * ratio - down));
     }
     // Keeps the page in the view; one that is narrower lies in the middle.
     void Clamp(int pageHeight) {

@@ -1,6 +1,6 @@
-// Counts the calls of our own functions that one warm DrawRect makes on the render thread, up to the draw list.
-// Built by bench/calls/run, with every function instrumented. Prints "calls N" and, for each function entered,
-// its module, offset and calls, which the script turns into files.
+// Counts the calls of the libraries' functions by one warm DrawRect on the render thread, up to the draw
+// list. bench/calls/run builds it with every function instrumented. It prints "calls N" and, for each entered
+// function, its module, offset and number of calls. The script converts these to source files.
 #include "moka/graphics/MokaGraphics.h"
 #include "moka/graphics/task/WorkerTask.h"
 #include "moka/host/RenderThread.h"
@@ -51,7 +51,7 @@ namespace {
 
 using namespace Moka;
 
-// Draws on the render thread as code does that runs there.
+// Draws with a render-thread canvas.
 class Drawing {
 public:
     UNCOUNTED explicit Drawing(IGLMsgQueue* queue) : mQueue(queue) {}

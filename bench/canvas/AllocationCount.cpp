@@ -17,7 +17,7 @@ std::uint64_t CountAllocations() { return tAllocations; }
 
 } // namespace Moka::Bench
 
-// The other forms of new come down to this one.
+// The other forms of operator new call this one.
 MOKA_API void* operator new(std::size_t size) {
     ++tAllocations;
     if (void* const memory = std::malloc(size > 0 ? size : 1)) return memory;

@@ -1,5 +1,5 @@
-// AllocationCount.h: how often the calling thread has asked operator new for memory. What C libraries and the
-// driver take from malloc does not count.
+// AllocationCount.h: counts the calls of operator new on the calling thread. Allocations by malloc in C
+// libraries and in the driver do not count.
 #pragma once
 
 #include <cstdint>

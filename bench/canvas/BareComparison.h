@@ -1,4 +1,5 @@
-// BareComparison.h: frames of the library and of bare GL in turn, so that whatever else the machine does hits both.
+// BareComparison.h: measures frames of the library and of bare GL alternately, so that other load on the
+// machine affects both.
 #pragma once
 
 #include "bench/canvas/BenchCanvas.h"
@@ -10,7 +11,7 @@
 
 namespace Moka::Bench {
 
-// Bare GL objects live on the render thread.
+// Creates and destroys an object with bare GL calls on the render thread.
 template <class T>
 class OnRenderThread {
 public:

@@ -1,5 +1,6 @@
-// BareGl.h: the few GL objects that the programs without the library are made of.
-// Thread: render thread; between frames the library may draw, so nothing here relies on GL state.
+// BareGl.h: the GL objects of the benchmarks' bare GL code.
+// Thread: render thread. The library may draw between frames, so this code does not depend on earlier GL
+//         state.
 #pragma once
 
 #include <GLES3/gl3.h>
@@ -9,7 +10,7 @@
 
 namespace Moka::Bench {
 
-// A source that does not compile ends the process. Attributes take their locations from the source.
+// A program. If it does not compile, the process ends. The source defines the attribute locations.
 class BareProgram {
 public:
     BareProgram(char const* vertexSource, char const* fragmentSource);
@@ -42,7 +43,7 @@ private:
     GLuint mFrameBuffer = 0;
 };
 
-// Vertices whose attributes 0, 1, ... have so many floats each.
+// Vertices. The numbers are the numbers of floats of the attributes 0, 1, ...
 class BareVertices {
 public:
     explicit BareVertices(std::initializer_list<int> attributes);
@@ -61,7 +62,7 @@ private:
     GLuint mBuffer = 0;
 };
 
-// Premultiplied source over destination, and nothing else on.
+// Sets blending to premultiplied source-over and switches all tests off.
 void SetBareState();
 
 } // namespace Moka::Bench

@@ -32,7 +32,8 @@ out vec4 result;
 void main() { result = vertexColor; }
 )";
 
-// From here on the programs can do what the library's can: coverage in each vertex, a colour, a tint.
+// The following programs have the same features as the library's: a coverage in each vertex, a colour, a
+// tint.
 constexpr char kTexturedVertex[] = R"(#version 300 es
 layout(location = 0) in vec3 vertex;
 layout(location = 1) in vec2 texturePosition;
@@ -93,7 +94,7 @@ void main() {
 }
 )";
 
-// Of one batch: the place in the shape and its sizes, and a colour.
+// The vertex stage of a batch. Each vertex has its position in the shape, the shape's sizes, and a colour.
 constexpr char kBatchVertex[] = R"(#version 300 es
 layout(location = 0) in vec2 position;
 layout(location = 1) in vec4 place;
@@ -199,7 +200,7 @@ constexpr int kCorners = 6; // of a rectangle: two triangles
 
 Vector4<float> Premultiply(Vector4<float> const& c) { return {c.x * c.w, c.y * c.w, c.z * c.w, c.w}; }
 
-// write(x, y, u, v) for each corner.
+// Calls write(x, y, u, v) for each corner.
 template <class Write>
 void ForEachCorner(RectF const& r, Write const& write) {
     write(r.left, r.top, 0.0f, 0.0f);
@@ -210,7 +211,7 @@ void ForEachCorner(RectF const& r, Write const& write) {
     write(r.right, r.bottom, 1.0f, 1.0f);
 }
 
-// The vertices of a frame, written into memory that the frames before it have left.
+// Writes the vertices of a frame to the memory of earlier frames.
 class Writer {
 public:
     Writer(std::vector<float>& floats, std::size_t count) {

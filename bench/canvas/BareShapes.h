@@ -1,5 +1,5 @@
-// BareShapes.h: what the benchmarks have the library draw, drawn by bare GL: the vertices are computed from
-// the same shapes and uploaded in each frame, because a frame's shapes are new.
+// BareShapes.h: draws the shapes of the benchmarks with bare GL. The vertices are computed from the same
+// shapes and uploaded in each frame, as for new shapes.
 // Thread: render thread, from construction to destruction.
 #pragma once
 
@@ -13,9 +13,9 @@ namespace Moka::Bench {
 class BareRects {
 public:
     BareRects();
-    // One draw call each, with the colour as the uniform that changes.
+    // Draws each rectangle with one draw call. The colour is a uniform.
     void DrawEach(int count, int size);
-    // All in one call, with a colour in each vertex.
+    // Draws all rectangles with one call. Each vertex has a colour.
     void DrawTogether(int count, int size);
 
 private:
@@ -41,10 +41,11 @@ private:
     std::vector<float> mFloats;
 };
 
-// Shapes of one kind and of distinct colours in one call. Each vertex has all that its shape's program needs.
+// Draws shapes of one kind and of different colours with one call. Each vertex has all values that the
+// program needs.
 class BareBatch {
 public:
-    // A covered rectangle has a coverage in each vertex, as the library's have.
+    // The vertices of a CoveredRect have a coverage, like the vertices of the library.
     enum class Shape { Rect, CoveredRect, Bitmap, Circle, Line };
 
     BareBatch(Shape shape, int size);
@@ -53,7 +54,7 @@ public:
 private:
     Shape const mShape;
     BareImage mTarget{kSide, kSide};
-    BareImage mSource; // of bitmaps
+    BareImage mSource; // the texture of Shape::Bitmap
     BareProgram mProgram;
     BareVertices mVertices{2, 4, 4};
     std::vector<float> mFloats;
@@ -72,7 +73,7 @@ private:
     std::vector<float> mFloats;
 };
 
-// Across and then down, nine samples each.
+// Blurs horizontally, then vertically, with nine samples each.
 class BareBlur {
 public:
     BareBlur();

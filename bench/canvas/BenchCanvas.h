@@ -1,4 +1,4 @@
-// BenchCanvas: a caller-side canvas over a bitmap of its own, and what the benchmarks draw on it.
+// BenchCanvas: a caller-side canvas with its bitmap, and the shapes that the benchmarks draw.
 #pragma once
 
 #include "bench/canvas/Frame.h"
@@ -26,7 +26,7 @@ struct BenchCanvas {
     RefPtr<IMKCanvas> const canvas;
 };
 
-// The top left corner of the shape number i of that size: spread over the target, at fractions of a pixel.
+// Returns the top left corner of shape i. Shapes are spread over the target, at fractions of a pixel.
 inline PointF PlaceOf(int i, int size) {
     int const room = kSide - size - 2;
     return {static_cast<float>(1 + i * 37 % room) + 0.25f, static_cast<float>(1 + i * 91 % room) + 0.5f};

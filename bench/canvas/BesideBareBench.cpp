@@ -1,4 +1,5 @@
-// The library beside bare GL that draws the same, in turn, so that whatever else the machine does hits both.
+// Compares the library with bare GL that draws the same. Frames alternate, so that other load on the machine
+// affects both.
 #include "bench/canvas/BareComparison.h"
 #include "bench/canvas/BareShapes.h"
 #include "moka/graphics/drawable/MKGaussianBlurDrawable.h"

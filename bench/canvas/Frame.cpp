@@ -29,7 +29,7 @@ double GetThreadSeconds() {
     return static_cast<double>(now.tv_sec) + static_cast<double>(now.tv_nsec) * 1e-9;
 }
 
-// The seconds between two calls.
+// Measures the seconds between two calls.
 class Lap {
 public:
     explicit Lap(double (*now)()) : mNow(now), mStart(now()) {}
@@ -46,7 +46,7 @@ private:
     double mStart;
 };
 
-// The tasks around a frame's own.
+// The tasks before and after those of a frame.
 class FrameTasks {
 public:
     void Hold() {
@@ -118,7 +118,7 @@ FrameCost MeasureFrame(std::function<void()> const& draw) {
     WorkerTask::PostMember(&thread, &tasks, &FrameTasks::End);
     tasks.Open();
     tasks.AwaitEnd();
-    // The last task may still be touching what belongs to it.
+    // The last task may still use the object.
     thread.WaitForTasks();
     return tasks.cost;
 }

@@ -1,7 +1,7 @@
-// Frame.h: what a frame costs, taken apart. The caller posts while the render thread is held by a task at the
-// head of the queue; then the render thread runs alone.
-// Units: seconds. CPU time of the thread that worked, so that other programs on the machine do not count;
-//        only waiting for the GPU is on the clock.
+// Frame.h: measures the cost of a frame by phase. The caller posts while a task holds the render thread; then
+// the render thread runs alone.
+// Units: seconds of the working thread's CPU time, so that other programs on the machine do not count. Only
+//        waiting for the GPU is wall-clock time.
 #pragma once
 
 #include "moka/renderer/RendererStatistics.h"
@@ -17,12 +17,12 @@ class RenderThread;
 
 namespace Moka::Bench {
 
-// Of the render thread.
+// The costs on the render thread.
 struct RenderCost {
-    double record = 0; // running the tasks; includes playing a list that was full
-    double play = 0;   // the flush
+    double record = 0; // running the tasks, including flushes of full lists
+    double play = 0;   // the flush at the end
     double finish = 0; // glFinish
-    double whole = 0;  // all of it, by the clock
+    double whole = 0;  // the whole frame, in wall-clock time
 
     double GetRender() const { return record + play; }
 };
@@ -35,7 +35,7 @@ struct FrameCost {
     RendererStatistics after;
 };
 
-// Made by the first call; StopRenderThread() ends it. A machine without a driver ends the process.
+// The first call starts the thread; StopRenderThread() ends it. Without a driver the process ends.
 RenderThread& GetRenderThread();
 void StopRenderThread();
 
@@ -45,7 +45,7 @@ FrameCost MeasureFrame(std::function<void()> const& draw);
 // Runs function, which calls GL, on the render thread, and waits for it.
 void CallBare(std::function<void()> const& function);
 
-// draw is called as by CallBare.
+// Measures draw, which is called as by CallBare.
 RenderCost MeasureBareFrame(std::function<void()> const& draw);
 
 } // namespace Moka::Bench

@@ -1,5 +1,5 @@
-// FrameCounters: gathers the costs of a benchmark's frames and reports them as counters: medians of times,
-// and what the last frame did.
+// FrameCounters: collects the costs of a benchmark's frames and reports them as counters: the medians of
+// times, and the statistics of the last frame.
 #pragma once
 
 #include "bench/canvas/Frame.h"
@@ -12,7 +12,7 @@ namespace Moka::Bench {
 
 class FrameCounters {
 public:
-    // A frame of so many things of a kind; times are reported for each of them, in units of a second.
+    // things is the number of items in a frame. Times are reported for each item, in this unit (in seconds).
     FrameCounters(benchmark::State& state, double things, double unit)
         : mState(state), mScale(1 / (things * unit)) {}
     ~FrameCounters() { Report(); }
@@ -20,7 +20,7 @@ public:
     FrameCounters& operator=(FrameCounters const&) = delete;
 
     void Add(FrameCost const& cost);
-    // The same frame drawn by bare GL, right before or after.
+    // Adds the cost of the same frame drawn by bare GL.
     void AddBare(RenderCost const& bare);
 
 private:

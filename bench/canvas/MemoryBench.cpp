@@ -1,6 +1,6 @@
-// What a request takes up while it waits to be run: a hundred thousand of them, of each kind in a process of
-// its own, because task memory is kept and used again.
-// Counters: heap_mb and rss_mb hold what was posted, bytes is the heap's for each request.
+// Measures the memory of requests that wait in the queue: 100,000 requests of each kind, each kind in its own
+// process, because task memory is pooled.
+// Counters: heap_mb and rss_mb are the memory of all requests; bytes is the heap memory of one.
 #include "moka/graphics/factory/BitmapsAndCanvases.h"
 #include "moka/graphics/paint/MKPaint.h"
 #include "moka/host/TaskQueue.h"
@@ -56,7 +56,7 @@ void DrawFourSimpleLines(IMKCanvas& canvas, IMKBitmap*, MKPaint const& paint) {
 using Request = void (*)(IMKCanvas&, IMKBitmap*, MKPaint const&);
 
 Usage PostAll(Request request) {
-    // Nobody runs it, so everything posted stays.
+    // The queue is never run, so all posted tasks stay.
     TaskQueue queue;
     auto const target = NewBitmap(queue, 64, 64);
     auto const bitmap = NewBitmap(queue, 64, 64);
@@ -68,7 +68,7 @@ Usage PostAll(Request request) {
     return {after.heap - before.heap, after.resident - before.resident};
 }
 
-// False when the process failed.
+// Returns false if the process failed.
 bool PostAllInOwnProcess(Request request, Usage& usage) {
     int ends[2];
     if (pipe(ends) != 0) return false;

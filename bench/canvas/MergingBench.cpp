@@ -1,4 +1,4 @@
-// Frames whose draws differ in what the renderer merges over: values, programs in turn, clips.
+// Frames whose draws differ in properties that merging supports: uniform values, alternating programs, clips.
 #include "bench/canvas/BareComparison.h"
 #include "bench/canvas/BareShapes.h"
 #include "moka/base/log/AndroidLog.h"
@@ -19,14 +19,14 @@ void Measure(benchmark::State& state, double things, DrawFrame const& drawFrame)
     for (auto _ : state) counters.Add(MeasureFrame(drawFrame));
 }
 
-// A clip that needs the stencil.
+// Sets a clip that needs the stencil.
 void ClipRotated(IMKCanvas& canvas, float degrees) {
     canvas.PreRotate(degrees, kSide / 2.0f, kSide / 2.0f);
     canvas.SetClipRect(100, 100, kSide - 200, kSide - 200, IMKCanvasBase::Intersect);
     canvas.SetMatrix(Matrix3<float>());
 }
 
-// The log lines of stencil clips go nowhere, but for one benchmark.
+// Drops the log lines of stencil clips, except in one benchmark.
 enum class ClipLog { Dropped, Written };
 
 class ClipLogging {
@@ -59,7 +59,7 @@ void ClippedRects(benchmark::State& state, int clips, bool each, ClipLog log) {
     });
 }
 
-// A round rectangle, an icon and two lines, in rows.
+// Draws rows of buttons: a round rectangle, an icon and two lines each.
 void Buttons(benchmark::State& state) {
     constexpr int kButtons = 500;
     constexpr int kColumns = 20;
@@ -82,7 +82,8 @@ void Buttons(benchmark::State& state) {
     });
 }
 
-// Two programs in turn, in rows of 64. With a step below their size each touches its neighbours.
+// Draws round rectangles in rows of 64, which alternate between two programs. If step is below size, they
+// overlap.
 void RoundRects(benchmark::State& state, int size, int step) {
     constexpr int kRoundRects = 4000;
     BenchCanvas target;
@@ -98,7 +99,7 @@ void RoundRects(benchmark::State& state, int size, int step) {
     });
 }
 
-// Everything that is drawn touches what was drawn before; integers differ from draw to draw.
+// Each draw overlaps earlier ones, and integer uniforms differ from draw to draw.
 void OverlappingCircles(benchmark::State& state) {
     BenchCanvas target;
     MKPaint paint;
@@ -112,7 +113,7 @@ void OverlappingCircles(benchmark::State& state) {
     });
 }
 
-// 20,000 strokes of 40 segments, panned by a pixel each frame.
+// Draws 20,000 strokes of 40 segments, panned by one pixel in each frame.
 void PageOfStrokes(benchmark::State& state) {
     constexpr int kStrokes = 20'000;
     constexpr int kSegments = 40;
@@ -156,7 +157,7 @@ void ManyRects(benchmark::State& state) {
     });
 }
 
-// The same shapes in one batch of bare GL, whose program is written for them alone.
+// Compares with one batch of bare GL, whose program draws only these shapes.
 void BesideBatch(benchmark::State& state, BareBatch::Shape shape, int size) {
     BenchCanvas target;
     RefPtr<IMKBitmap> const bitmap = MakeBitmap(size, size);

@@ -1,5 +1,5 @@
-// Rectangles over the device without a driver: what the library itself costs on the render thread, recording
-// and flushing, and on the caller's thread.
+// Draws rectangles with the device without a driver, to measure the library's own cost on the render thread
+// (recording and flushing) and on the caller's thread.
 #include "moka/graphics/MokaGraphics.h"
 #include "moka/host/RenderThread.h"
 
@@ -20,7 +20,8 @@ RenderThread& GetQueue() {
     return *queue;
 }
 
-// atOnce: a canvas of the render thread, used there; otherwise one that posts, and the wait for it.
+// atOnce: uses a render-thread canvas on the render thread. Otherwise a caller-side canvas posts, and the
+// time includes waiting for the tasks.
 void DrawRectangles(benchmark::State& state, bool atOnce, bool distinct) {
     RenderThread& queue = GetQueue();
     UseFrom const from = atOnce ? UseFrom::RenderThread : UseFrom::AnyThread;

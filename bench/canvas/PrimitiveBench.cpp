@@ -1,4 +1,4 @@
-// Frames of many primitives of one kind, each a request of its own.
+// Frames of many primitives of one kind, one request each.
 #include "bench/canvas/BenchCanvas.h"
 #include "bench/canvas/FrameCounters.h"
 #include "bench/canvas/Registration.h"
@@ -88,7 +88,7 @@ void DrawShapes(benchmark::State& state, Primitive const& primitive, int size, C
     for (auto _ : state) counters.Add(MeasureFrame(drawFrame));
 }
 
-// Each of these reads what it is drawn over. The texture that the copy goes to is made once.
+// Draws with Darken and Lighten, which copy the destination. The texture for the copy is created once.
 void DrawDarkerAndLighter(benchmark::State& state) {
     constexpr int kDraws = 50;
     constexpr int kSize = 64;
@@ -102,7 +102,7 @@ void DrawDarkerAndLighter(benchmark::State& state) {
             target.canvas->DrawBitmap(bitmap.Get(), place.x, place.y, &paint);
         }
     };
-    MeasureFrame([] {}); // what earlier benchmarks have dropped is gone after it
+    MeasureFrame([] {}); // frees objects of earlier benchmarks
     FrameCost const first = MeasureFrame(drawFrame);
     FrameCounters counters(state, kDraws, 1e-9);
     FrameCost last;

@@ -1,5 +1,5 @@
-// Registration.h: the benchmarks that are made from tables. Called in main, because the scenes need what is
-// initialised before it.
+// Registration.h: registers the benchmarks that are generated from tables. main calls these functions,
+// because the scenes depend on static objects.
 #pragma once
 
 namespace Moka::Bench {

@@ -1,4 +1,5 @@
-// The scenes of the gallery, as the gallery draws them: pictures are uploaded, objects made, in each frame.
+// Draws the scenes of the gallery. Each frame uploads the bitmaps and creates all objects, as the gallery
+// does.
 #include "bench/canvas/BenchCanvas.h"
 #include "bench/canvas/FrameCounters.h"
 #include "bench/canvas/Registration.h"
@@ -15,7 +16,7 @@ void Draw(benchmark::State& state, Scenes::Scene const& scene) {
     BenchCanvas target(scene.width, scene.height);
     Scenes::QueueStage stage(GetRenderThread());
     auto const drawFrame = [&] {
-        target.canvas->SetMatrix(Matrix3<float>()); // a scene may leave another one
+        target.canvas->SetMatrix(Matrix3<float>()); // scenes do not reset the matrix
         Scenes::DrawScene(scene, *target.canvas, stage);
     };
     for (int i = 0; i < kWarmUpFrames; ++i) MeasureFrame(drawFrame);
@@ -27,7 +28,7 @@ void Draw(benchmark::State& state, Scenes::Scene const& scene) {
 
 void RegisterScenes() {
     for (Scenes::Scene const& scene : Scenes::GetScenes()) {
-        if (scene.needsPen) continue; // what foreign code draws is not ours to measure
+        if (scene.needsPen) continue; // external code draws these
         std::string const name = "Scene/" + scene.name;
         benchmark::RegisterBenchmark(name.c_str(), [&scene](benchmark::State& state) { Draw(state, scene); })
             ->UseManualTime()

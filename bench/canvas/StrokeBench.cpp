@@ -1,6 +1,6 @@
-// A page of pen strokes, panned by a pixel in each frame: 20,000 of 41 points. Beside it bare GL draws each
-// segment as a quad with round ends, all in one call, from vertices that it has ready; where segments meet
-// or cross, it blends twice.
+// Draws a page of 20,000 pen strokes of 41 points, panned by one pixel in each frame. For comparison, bare GL
+// draws each segment as a quad with round ends, all with one call, from prepared vertices; where segments
+// meet or cross, it blends twice.
 #include "bench/canvas/BareComparison.h"
 #include "bench/canvas/BareGl.h"
 #include "moka/graphics/drawable/MKStrokeDrawable.h"
@@ -151,7 +151,8 @@ BENCHMARK_CAPTURE(Page, translucent, Ink::Translucent, 1.0f)->Apply(Configure);
 BENCHMARK_CAPTURE(Page, a_quarter_as_large, Ink::ManyColors, 0.25f)->Apply(Configure);
 BENCHMARK_CAPTURE(Page, four_times_as_large, Ink::ManyColors, 4.0f)->Apply(Configure);
 
-// What appending and the first draw cost for each point, in nanoseconds; and a draw after each single point.
+// Measures, in nanoseconds for each point, appending and the first draw, and drawing after each appended
+// point.
 void Append(benchmark::State& state) {
     auto const count = static_cast<int>(state.range(0));
     BenchCanvas target(kPageWidth, kPageHeight);

@@ -1,9 +1,10 @@
-// What drawing costs: the caller's side (posting), the render thread's (running the tasks and flushing), and
-// waiting for the driver to finish, with the renderer's counters for a frame.
-// Counters: caller, record, render, finish are medians; nanoseconds for each primitive, microseconds for each
-//           scene. record is the part of render before the flush. render_ratio and whole_ratio hold the
-//           render thread's time, and its time with the finish, against bare GL programs' that draw the same
-//           in the same run, in turn. The others are counts of the last frame.
+// Measures the cost of drawing: on the caller's thread (posting), on the render thread (running the tasks and
+// flushing), and waiting for the driver to finish.
+// Counters: caller, record, render and finish are medians, in nanoseconds for each primitive or microseconds
+// for each
+//           scene. record is the part of render before the flush. render_ratio and whole_ratio are the render
+//           thread's time, without and with waiting, divided by that of bare GL, which draws the same in
+//           alternate frames. The others are the renderer's statistics of the last frame.
 #include "bench/canvas/Frame.h"
 #include "bench/canvas/Registration.h"
 #include "moka/host/RenderThread.h"

@@ -1,7 +1,8 @@
-// CodecBench.cpp: how fast image files are read and written, in megapixels a second, and how large they are.
-// Two pictures of 2048 x 2048: a page of sparse pen strokes on nothing, and a smooth picture with some grain.
-// DecodeSrgb and DecodeP3 read the latter with such a profile, beside Decode, which reads it without.
-// Files stand in memory where the system offers that, so that the disk is not what is measured.
+// CodecBench.cpp: measures the speed of reading and writing image files, in megapixels a second, and the
+// sizes of files. There are two pictures of 2048 x 2048: sparse pen strokes on transparency, and a smooth
+// picture with grain. DecodeSrgb and DecodeP3 read the latter with an sRGB and a Display P3 profile; Decode
+// reads it without a profile. Files are in memory if the system supports it, so that the disk is not
+// measured.
 #include "moka/base/Bitmap.h"
 #include "moka/base/BitmapFactory.h"
 #include "moka/base/String.h"
@@ -29,7 +30,7 @@ using Moka::String;
 constexpr int kSide = 2048;
 using Pixels = std::vector<unsigned char>;
 
-// A round pen tip with a soft edge, one pixel wide, over what is there.
+// Draws a disc with a soft edge, one pixel wide.
 void Dab(Pixels& pixels, double x, double y, double radius, unsigned char const (&colour)[3]) {
     for (int v = std::max(0, static_cast<int>(y - radius)); v < std::min<double>(kSide, y + radius + 1);
          ++v) {
@@ -93,7 +94,7 @@ Bitmap& GetBitmap(Picture picture) {
     return bitmap;
 }
 
-// The folder goes when the program ends.
+// A temporary folder, removed when the program ends.
 struct Folder {
     Folder() {
         std::filesystem::path const memory = "/dev/shm";
@@ -127,7 +128,7 @@ void Encode(benchmark::State& state, Picture picture, char const* extension, int
     Report(state, path);
 }
 
-// Into a square of this side; the picture's own is not scaled.
+// Decodes to a square of this side. With the picture's own side it is not scaled.
 void Decode(benchmark::State& state, Picture picture, char const* extension, int quality, int side) {
     std::string const path = PathFor(picture, extension, quality);
     String const text(path);

@@ -1,8 +1,9 @@
-// What a trace costs: a frame of 5,000 rectangles, from the first request until a pixel of it has been read, without
-// a trace and with one. Both take turns, so that they meet the same machine.
-// Time:     of frames without a trace, the mean.
-// Counters: of the processor time that the process spends on a frame, all threads together, because other programs
-//           do not count there: the lower quartiles of both, and how much more a traced frame takes, in percent.
+// Measures the cost of a trace: frames of 5,000 rectangles, from the first request until a pixel has been
+// read back, alternately without and with a trace.
+// Time:     the mean of frames without a trace.
+// Counters: the CPU time of the process for a frame, on all threads, so that other programs do not count: the
+// lower
+//           quartiles without and with a trace, and the difference in percent.
 #include "moka/base/RefPtr.h"
 #include "moka/base/Trace.h"
 #include "moka/graphics/MokaGraphics.h"
@@ -27,7 +28,7 @@ double GetLowerQuartile(std::vector<double>& values) {
     return *place;
 }
 
-// Milliseconds.
+// Returns the CPU time of the process in milliseconds.
 double GetProcessorTime() {
     timespec time{};
     clock_gettime(CLOCK_PROCESS_CPUTIME_ID, &time);
@@ -41,7 +42,7 @@ public:
               MKGraphicsFactory::CreateBitmap(&queue, kSide, kSide, nullptr, false, 1, false))),
           mCanvas(RefPtr<IMKCanvas>::Adopt(MKGraphicsFactory::CreateCanvas(&queue, mBitmap.Get(), 1))) {}
 
-    // Milliseconds of processor time.
+    // Returns the CPU time in milliseconds.
     double Draw(bool isColorful) {
         double const begin = GetProcessorTime();
         MKPaint paint;

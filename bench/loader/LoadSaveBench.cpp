@@ -1,7 +1,7 @@
-// A hundred pictures loaded onto the GPU and saved again, over the real renderer: through the loader and the
-// save manager, beside two loops on one thread: the codecs alone, and the codecs with upload and read-back
-// between them. "ratio" is the loader's time over the codecs', "ratio_pipeline" over the whole loop's;
-// medians of pairs.
+// Loads a hundred pictures to the GPU and saves them again, with the loader and the save manager. For
+// comparison, two loops on one thread: the codecs alone, and the codecs with upload and read-back between
+// them. "ratio" is the loader's time divided by that of the codecs, "ratio_pipeline" divided by that of the
+// second loop; both are medians.
 #include "moka/base/Bitmap.h"
 #include "moka/base/BitmapFactory.h"
 #include "moka/base/RefPtr.h"
@@ -54,7 +54,7 @@ RenderThread& Queue() {
     return *queue;
 }
 
-// Light from one corner with sensor noise, as photographs compress.
+// A gradient with noise, which compresses like a photograph.
 Testing::Picture MakePhoto(unsigned seed) {
     Testing::Picture image(kSide, kSide);
     std::mt19937 random(seed);
@@ -68,7 +68,7 @@ Testing::Picture MakePhoto(unsigned seed) {
     return image;
 }
 
-// In memory where the system offers that, so that the disk is not what is measured.
+// The files, in memory if the system supports it, so that the disk is not measured.
 class Pictures {
 public:
     explicit Pictures(std::string const& extension) {
@@ -116,11 +116,11 @@ void RunPipeline(Pictures const& pictures) {
     }
 }
 
-// Each picture that arrives asks for its save and for the next picture.
+// Each loaded picture requests its save and the next load.
 void RunLoader(Pictures const& pictures) {
     MKBitmapSaveManager saves;
     MKBitmapLoader* loader = nullptr;
-    int next = 0; // the loader's thread alone counts, once it has begun
+    int next = 0; // changed on the loader's thread only, after the start
     std::promise<void> allRequested;
     MKBitmapLoader::Callback callback;
     auto const requestNext = [&] {
@@ -161,7 +161,7 @@ double Median(std::vector<double> values) {
 void LoadAndSave(benchmark::State& state, char const* extension) {
     Queue();
     Pictures const pictures(extension);
-    RunLoader(pictures); // the allocators and the driver get what they will need
+    RunLoader(pictures); // warms up allocators and driver
     std::vector<double> ours;
     std::vector<double> ratios;
     std::vector<double> pipelineRatios;

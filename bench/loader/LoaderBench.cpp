@@ -1,6 +1,6 @@
-// What the loader's queue costs: requests through an empty decode beside a plain thread and queue, queueing
-// and cancelling many, and the latency of a cancel while a picture is being decoded. Log lines are formatted
-// and thrown away, as in a process whose log goes nowhere; each request has some ten of them, by contract.
+// Measures the loader's queue: requests with an empty decode, compared with a plain thread and queue;
+// queueing and cancelling many requests; and the latency of a cancel while a picture is being decoded. Log
+// lines, about ten for each request, are formatted and dropped.
 #include "moka/base/Bitmap.h"
 #include "moka/base/BitmapFactory.h"
 #include "moka/base/String.h"
@@ -54,7 +54,7 @@ void StartOnce() {
     if (!started) std::abort();
 }
 
-// What one would write first: a deque of jobs under a mutex, notified at each.
+// The simplest loader: a deque of jobs with a mutex, and a notification for each job.
 class PlainLoader {
 public:
     using Callback = std::function<void(int id, String const& path)>;
@@ -117,7 +117,7 @@ private:
     std::condition_variable mChanged;
 };
 
-// An empty path fails before any file is touched: the emptiest decode there is.
+// An empty path fails before a file is opened, so the decode costs nearly nothing.
 void RequestsThroughAnEmptyDecode(benchmark::State& state) {
     StartOnce();
     constexpr int kRequests = 5000;
@@ -148,7 +148,7 @@ void RequestsThroughAnEmptyDecode(benchmark::State& state) {
 }
 BENCHMARK(RequestsThroughAnEmptyDecode)->Iterations(20)->UseManualTime()->Unit(benchmark::kMillisecond);
 
-// Holds the loader's thread in a callback, so that what is requested meanwhile stays queued.
+// Blocks the loader's thread in a callback, so that later requests stay queued.
 class HeldLoop {
 public:
     HeldLoop() {
@@ -176,7 +176,7 @@ private:
     std::unique_ptr<BitmapLoader> mLoader;
 };
 
-// Queues many for one or two listeners in turn, then cancels the first one's as a whole.
+// Queues many requests of one or two listeners alternately, then cancels all of the first one.
 void QueueAndCancelAll(benchmark::State& state) {
     StartOnce();
     auto const requests = static_cast<int>(state.range(0));
@@ -225,8 +225,8 @@ private:
             .string()};
 };
 
-// How long the caller is held up by cancelling a load that is being decoded, with more in the queue behind
-// it.
+// Measures how long cancelling a load blocks the caller, while the load is being decoded and others are
+// queued.
 void CancelWhileDecoding(benchmark::State& state) {
     StartOnce();
     static PictureFile const picture;
@@ -240,7 +240,7 @@ void CancelWhileDecoding(benchmark::State& state) {
         loader.RequestLoad(1, picture.GetPath(), nullptr);
         for (int id = 0; id < queued; ++id) others.RequestLoad(id, String(), nullptr);
         held.Release();
-        std::this_thread::sleep_for(std::chrono::milliseconds(5)); // in the middle of the file
+        std::this_thread::sleep_for(std::chrono::milliseconds(5)); // until it decodes
         latencies.push_back(Seconds([&] { loader.CancelLoadRequest(1); }));
         others.CancelAllLoadRequest();
         decodes.push_back(Seconds([] { BitmapLoader::WaitUntilMsgQueueRequired(); }));

@@ -1,5 +1,5 @@
-// Burst: one queue with its consumer and producers. Each burst lets every producer post the same number of
-// tasks to a consumer that was asleep, and tells what a post cost the producer.
+// Burst: one queue with its consumer and producers. In each burst every producer posts the same number of
+// tasks to a sleeping consumer. The result is the producers' time for each post.
 #pragma once
 
 #include <atomic>
@@ -27,7 +27,7 @@ struct Paint {
     int flags[6];
 };
 
-// What the tasks are run on: the render side of a drawing call, without the drawing.
+// The receiver of the tasks: stands in for the render side of a canvas, and draws nothing.
 class Receiver {
 public:
     explicit Receiver(std::chrono::nanoseconds work) : mWork(work) {}
@@ -49,7 +49,7 @@ private:
     std::atomic<long> mCount{0};
 };
 
-// Queue offers Post(Receiver*, Rectangle const&, Matrix const&, Paint const&), Run() and Stop().
+// Queue must have Post(Receiver*, Rectangle const&, Matrix const&, Paint const&), Run() and Stop().
 template <class Queue>
 class Burst {
 public:
@@ -65,7 +65,7 @@ public:
         for (int i = 0; i < producers; ++i) mProducers.emplace_back([this] { Produce(); });
     }
 
-    // Nanoseconds for each post, as its producer saw it, the consumer's first waking included.
+    // Returns the producers' nanoseconds for each post, including the consumer's first wake-up.
     double Run() {
         long const goal = mReceiver.GetCount() + GetPostsInBurst();
         {
@@ -77,12 +77,12 @@ public:
             mChanged.wait(lock, [this] { return mUnfinished == 0; });
         }
         while (mReceiver.GetCount() < goal) std::this_thread::sleep_for(std::chrono::microseconds(50));
-        // Long enough for the consumer to fall asleep.
+        // Gives the consumer time to fall asleep.
         std::this_thread::sleep_for(std::chrono::microseconds(200));
         return static_cast<double>(mElapsed.count()) / static_cast<double>(GetPostsInBurst());
     }
 
-    // How often the consumer gave up its core so far, for each post. Ends the burst's threads.
+    // Ends the threads. Returns the number of times that the consumer slept, divided by the number of posts.
     double StopAndCountSleeps() {
         {
             std::lock_guard<std::mutex> const lock(mMutex);

@@ -1,5 +1,5 @@
-// PlainQueue: what one would write first: a deque of owned calls under a mutex, notified at each post, with
-// everything from the default allocator. The measure that TaskQueue is held against.
+// PlainQueue: the simplest queue: a deque of tasks with a mutex, a notification for each post, and the
+// default allocator. TaskQueue is compared with it.
 #pragma once
 
 #include <condition_variable>

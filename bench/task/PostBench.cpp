@@ -1,8 +1,9 @@
-// What it costs a caller to allocate, fill and post one drawing task of about 150 bytes, beside the queue one
-// would write first, in the same run. Both take turns, so that they meet the same machine.
-// Time:     of TaskQueue, the mean over the bursts, for each post as its producer sees it.
-// Counters: the medians over the bursts, how many times faster TaskQueue is, and how often each consumer gave
-//           up its core for each post (1 would be a wake-up for every task).
+// Measures the caller's time to allocate, fill and post one drawing task of about 150 bytes, with TaskQueue
+// and PlainQueue alternately.
+// Time:     the producers' mean time for each post with TaskQueue.
+// Counters: the medians over the bursts, their ratio, and how often each consumer slept for each post (1
+// means a wake-up
+//           for every task).
 #include "bench/task/Burst.h"
 #include "bench/task/PlainQueue.h"
 #include "moka/graphics/task/WorkerTask.h"
@@ -49,7 +50,7 @@ void Compare(benchmark::State& state, std::chrono::nanoseconds work) {
     Burst<FirstQueue> plain(producers, work);
     std::vector<double> pooledTimes;
     std::vector<double> plainTimes;
-    for (int i = 0; i < 10; ++i) { // the allocators get what they will need
+    for (int i = 0; i < 10; ++i) { // warms up the allocators
         pooled.Run();
         plain.Run();
     }

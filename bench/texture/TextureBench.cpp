@@ -1,6 +1,6 @@
-// Pixels up and back through the renderer, beside the same transfer in bare GL, call by call in turn, so that
-// whatever else the machine does hits both alike. The counter to read is "ratio": the renderer's time over
-// bare GL's, the median of all pairs. Each transfer ends with glFinish, because drivers put uploads off.
+// Measures uploads and read-backs of the renderer and of bare GL alternately, so that other load on the
+// machine affects both. The main counter is "ratio": the renderer's time divided by bare GL's, the median of
+// all pairs. Each transfer ends with glFinish, because drivers defer uploads.
 #include "moka/base/Rect.h"
 #include "moka/host/EglContext.h"
 #include "moka/renderer/IRenderTarget.h"
@@ -32,7 +32,7 @@ std::vector<std::uint32_t>& GetPixels() {
 
 std::uint32_t* RowOf(int y) { return GetPixels().data() + static_cast<std::ptrdiff_t>(y) * kSide; }
 
-// Once for all benchmarks; the process's end takes it down.
+// Attaches the context once for all benchmarks. It lives until the process ends.
 void AttachOnce() {
     static std::unique_ptr<detail::EglContext> const egl = [] {
         std::string error;
@@ -41,7 +41,7 @@ void AttachOnce() {
             std::fprintf(stderr, "%s\n", error.c_str());
             std::exit(1);
         }
-        // As a host with a queue runs it.
+        // The mode that a host with a queue uses.
         RendererFactory::SetDeferred(true);
         return context;
     }();
@@ -104,7 +104,7 @@ void Compare(benchmark::State& state, std::int64_t bytes, Ours const& ours, Bare
 
 constexpr std::int64_t BytesOf(int width, int height) { return std::int64_t{4} * width * height; }
 
-// The whole of a texture, or a block of half its width out of the larger image.
+// Uploads a whole texture, or a block of half its width from a larger image.
 void Upload(benchmark::State& state) {
     AttachOnce();
     int const width = static_cast<int>(state.range(0));
@@ -124,7 +124,7 @@ void Upload(benchmark::State& state) {
 }
 BENCHMARK(Upload)->Arg(kSide)->Arg(kSide / 2)->UseManualTime()->Unit(benchmark::kMicrosecond);
 
-// A tall image as strips: making the textures belongs to it.
+// Uploads a tall image as strips, including the creation of the textures.
 void UploadStrips(benchmark::State& state) {
     AttachOnce();
     constexpr int kHeight = kSide / kStrips;
@@ -148,8 +148,8 @@ void UploadStrips(benchmark::State& state) {
 }
 BENCHMARK(UploadStrips)->UseManualTime()->Unit(benchmark::kMicrosecond);
 
-// The bare side reads from a frame buffer that is bound already, the renderer binds its own; a single pixel
-// shows what that costs.
+// Bare GL reads from a frame buffer that is already bound; the renderer binds its own. Reading a single pixel
+// shows the cost of that.
 void ReadBack(benchmark::State& state) {
     AttachOnce();
     int const side = static_cast<int>(state.range(0));

@@ -11,7 +11,7 @@ unsigned char* CopyPixels(unsigned char const* source, std::size_t sourceStride,
                           std::size_t rows) {
     auto* const copy = new (std::nothrow) unsigned char[rowBytes * rows];
     if (!copy) return nullptr;
-    // By row: the source may end with its last pixel, short of a whole stride.
+    // Copies row by row, because the source may end after its last pixel, before a whole stride.
     for (std::size_t row = 0; row < rows; ++row) {
         std::memcpy(copy + row * rowBytes, source + row * sourceStride, rowBytes);
     }

@@ -1,7 +1,7 @@
-/// Bitmap: a CPU image over one pixel buffer.
-/// Units:  pixels, first row first; format 1 is RGBA8, premultiplied, four bytes a pixel. Stride is in bytes.
-/// Owner:  the buffer is `new unsigned char[]`; it is freed with array delete on destruction while the
-///         delete-buffer switch is on, and otherwise belongs to the code that switched it off.
+/// Bitmap: an image in CPU memory, in one pixel buffer.
+/// Units:  pixels, top row first; format 1 is RGBA8, premultiplied, four bytes a pixel. Stride is in bytes.
+/// Owner:  the buffer comes from `new unsigned char[]`. If the delete-buffer switch is on, the destructor
+///         deletes it. Otherwise the code that switched it off owns the buffer.
 /// Thread: not synchronised.
 #pragma once
 
@@ -18,9 +18,9 @@ public:
     Bitmap() = default;
     virtual ~Bitmap();
 
-    /// Takes the buffer over as it is, or a copy of its pixels at stride width * 4 (copyPixels: the bitmap
-    /// then owns its copy, regardless of deleteBuffer, and the buffer stays the caller's). False, with the
-    /// bitmap and the buffer untouched, when the bitmap already has pixels, the buffer is null, a side is
+    /// Uses the buffer, and takes ownership of it if deleteBuffer is true. With copyPixels it copies the
+    /// pixels instead, with stride width * 4: the bitmap then owns the copy, and the caller keeps the buffer.
+    /// Returns false and changes nothing if the bitmap already has pixels, the buffer is null, a side is
     /// below 1, the stride is below width * 4, the format is not 1, or the copy cannot be allocated.
     bool Construct(unsigned char* buffer, int width, int height, int stride, int format, bool copyPixels,
                    bool deleteBuffer);
@@ -31,10 +31,10 @@ public:
     int GetStride() const { return mStride; }
     /// kFormatRgba8888, or 0 before Construct.
     int GetFormat() const { return mFormat; }
-    /// The pixels, first row first; null before Construct.
+    /// The pixels, top row first; null before Construct.
     unsigned char* GetBuffer() const { return mBuffer; }
 
-    /// Whether the destructor frees the buffer.
+    /// The delete-buffer switch: if it is on, the destructor deletes the buffer.
     void SetDeleteBuffer(bool on) { mDeleteBuffer = on; }
     bool GetDeleteBuffer() const { return mDeleteBuffer; }
 

@@ -1,6 +1,6 @@
-// Check.h: broken contracts, found early. MOKA_CHECK(condition, text) ends the process with the text when
-// checks are compiled in (MOKA_CHECKS, set in debug builds) and costs nothing otherwise; the condition is
-// then not evaluated. Expected failures are return values and log lines, never checks.
+// Check.h: detects broken contracts. If checks are compiled in (MOKA_CHECKS, set in debug builds),
+// MOKA_CHECK(condition, text) logs the text and ends the process if the condition is false. Otherwise the
+// condition is not evaluated. Expected failures are return values and log lines, never checks.
 #pragma once
 
 #include "moka/base/Export.h"

@@ -25,7 +25,7 @@ timespec DeadlineIn(int milliseconds) {
 ConditionalVariable::ConditionalVariable() {
     pthread_condattr_t attributes;
     pthread_condattr_init(&attributes);
-    // Setting the wall clock must not lengthen or cut short a wait.
+    // The monotonic clock, so that changing the wall clock does not change the duration of a wait.
     pthread_condattr_setclock(&attributes, CLOCK_MONOTONIC);
     pthread_cond_init(&mCondition, &attributes);
     pthread_condattr_destroy(&attributes);

@@ -1,6 +1,5 @@
-/// ConditionalVariable: lets threads sleep until something they watch, guarded by a CriticalSection, changes.
-/// Signal wakes every waiter, since several threads wait for different things on one condition. Wake-ups can
-/// be spurious: test in a loop.
+/// ConditionalVariable: a condition variable for a CriticalSection. Signal wakes all waiting threads, because
+/// they may wait for different conditions. Wake-ups can be spurious: test the condition in a loop.
 #pragma once
 
 #include "moka/base/CriticalSection.h"
@@ -14,10 +13,11 @@ namespace Moka {
 class MOKA_API ConditionalVariable : NonAssignable {
 public:
     ConditionalVariable();
-    ~ConditionalVariable(); ///< nobody waits
+    ~ConditionalVariable(); ///< no thread may wait
 
-    /// The caller is inside lock exactly once (also when it is recursive); it is left while sleeping and
-    /// entered again before the return. milliseconds -1 waits without limit. False when the time ran out.
+    /// Releases the lock, waits for a signal, and enters the lock again. The caller must have entered it
+    /// exactly once, even if it is recursive. With milliseconds -1 it waits without limit. Returns false
+    /// after the time-out.
     bool Wait(CriticalSection& lock, int milliseconds = -1);
 
     /// Wakes all waiting threads.

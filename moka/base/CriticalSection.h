@@ -1,5 +1,5 @@
-/// CriticalSection: a mutual-exclusion lock, recursive on request. AutoCriticalSection holds it for a scope.
-/// A non-recursive one that is entered twice by one thread never returns.
+/// CriticalSection: a mutex, recursive if requested. AutoCriticalSection holds it for a scope. If a thread
+/// enters a non-recursive one twice, it waits for ever.
 #pragma once
 
 #include "moka/base/Export.h"
@@ -9,21 +9,21 @@
 
 namespace Moka {
 
-/// Over POSIX: there the kind of mutex is chosen when it is made, and one condition works with either kind.
+/// It uses POSIX mutexes, whose kind is chosen at run time, and a condition variable works with both kinds.
 class MOKA_API CriticalSection : NonAssignable {
 public:
     /// A recursive lock may be entered again by the thread that holds it.
     explicit CriticalSection(bool recursive);
-    ~CriticalSection(); ///< nobody is inside
+    ~CriticalSection(); ///< no thread may hold the lock
 
-    /// Waits until no other thread is inside.
+    /// Waits until no other thread holds the lock, and takes it.
     void Enter();
-    void Leave(); ///< by the thread that entered
+    void Leave(); ///< releases the lock; called by the thread that entered
 
 private:
     friend class ConditionalVariable;
     pthread_mutex_t mMutex;
-    int mDepth = 0; // how often the thread inside has entered; guarded by the mutex itself
+    int mDepth = 0; // how often the holding thread has entered; guarded by the mutex
 };
 
 /// Holds a CriticalSection from construction to destruction.

@@ -1,8 +1,8 @@
 /// Handler: delivers messages to a function on the thread that created it, through that thread's MessageLoop.
-/// A handler created on a thread without a loop logs an error and refuses every message.
-/// Thread: SendMessage and HasMessage from any. Destruction withdraws pending messages and waits for a
-///         running one, unless it happens on the loop's own thread, where the message can only be one that is
-///         destroying it.
+/// If it is created on a thread without a loop, it logs an error and refuses every message.
+/// Thread: SendMessage and HasMessage on any thread. The destructor removes pending messages. It also waits
+///         for a running message, except on the loop's thread, where the running message is the one that
+///         destroys the handler.
 #pragma once
 
 #include "moka/base/Export.h"
@@ -21,14 +21,15 @@ public:
     /// Runs on the thread that created the handler. what is the number of the message.
     using Function = void (*)(Handler* handler, void* argument, int what);
 
-    /// Delivers to function on this thread, with argument.
+    /// Creates a handler that calls function with argument, on the current thread.
     Handler(Function function, void* argument);
     ~Handler();
 
-    /// Whether a message of this number waits to be run; one that is running does not.
+    /// True if a message of this number is queued. A running message does not count.
     bool HasMessage(int what = 0) const;
 
-    /// Queues a message; false when the loop is gone, the handler is being destroyed or memory is out.
+    /// Queues a message. Returns false if the loop was destroyed, the handler is being destroyed, or memory
+    /// runs out.
     bool SendMessage(int what = 0);
 
 private:

@@ -1,6 +1,6 @@
-/// List: an ordered list of pointers that it does not own.
-/// Cost:   adding at the end and removing at either end are amortised O(1), so it serves as a queue; removing
-///         elsewhere moves what follows. An empty list that was never filled has allocated nothing.
+/// List: an ordered list of pointers. It does not own the objects.
+/// Cost:   adding at the end and removing at either end are amortised O(1), so it can be used as a queue.
+///         Removing elsewhere moves the following items. A list that was never filled has allocated nothing.
 /// Thread: not synchronised.
 /// Fails:  nothing throws.
 #pragma once
@@ -15,7 +15,7 @@ namespace Moka {
 template <class T>
 class List {
 public:
-    /// Completes construction; false without memory. May be called once.
+    /// Completes the construction. Call it once. Always returns true.
     bool Construct() { return true; }
 
     /// The number of items.
@@ -23,13 +23,13 @@ public:
     /// True without items.
     bool IsEmpty() const { return GetCount() == 0; }
 
-    /// Null when index is outside 0 ... count - 1.
+    /// The item at index; null if index is outside 0 ... count - 1.
     T* GetAt(int index) const {
         std::size_t const at = mTaken + static_cast<std::size_t>(index);
         return index >= 0 && at < mItems.size() ? mItems[at] : nullptr;
     }
 
-    /// False, with the list unchanged, without memory for the item.
+    /// Appends an item. Returns false and changes nothing if memory runs out.
     [[nodiscard]] bool Add(T* item) {
         try {
             mItems.push_back(item);
@@ -39,7 +39,7 @@ public:
         }
     }
 
-    /// Takes the item out and returns it; null when index is outside 0 ... count - 1.
+    /// Removes and returns the item at index; null if index is outside 0 ... count - 1.
     T* RemoveAt(int index) {
         if (index < 0 || index >= GetCount()) return nullptr;
         auto const at = Begin() + index;
@@ -48,7 +48,7 @@ public:
         return item;
     }
 
-    /// Removes the first occurrence; false when there is none.
+    /// Removes the first occurrence of item. Returns false if there is none.
     bool Remove(T const* item) {
         auto const at = std::find(Begin(), mItems.end(), item);
         if (at == mItems.end()) return false;
@@ -73,7 +73,7 @@ private:
             return;
         }
         ++mTaken;
-        // Moving the rest up only when it is the smaller half keeps a removal at the front O(1) on average.
+        // Moving the items only if at least half of the entries are removed ones keeps this O(1) on average.
         if (mTaken * 2 < mItems.size()) return;
         mItems.erase(mItems.begin(), Begin());
         mTaken = 0;

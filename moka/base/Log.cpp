@@ -10,19 +10,19 @@
 namespace Moka {
 namespace {
 
-// What follows a dot may be a sentence; only something this short and plain is taken for a file type.
+// The text after a dot may be part of a sentence. Only a short plain text counts as an extension.
 constexpr std::size_t kLongestExtension = 5;
 
 bool IsPlain(char16_t unit) {
     return (unit >= u'0' && unit <= u'9') || (unit >= u'a' && unit <= u'z') || (unit >= u'A' && unit <= u'Z');
 }
 
-// Where the extension starts, with its dot; the length when there is none.
+// Returns the position of the extension's dot, or the length of the text if there is no extension.
 std::size_t FindExtension(std::u16string_view text) {
     std::size_t const slash = text.rfind(u'/');
     std::size_t const name = slash == std::u16string_view::npos ? 0 : slash + 1;
     std::size_t const dot = text.rfind(u'.');
-    // A dot that begins the name hides the file and starts no extension.
+    // A dot at the beginning of the name marks a hidden file, not an extension.
     if (dot == std::u16string_view::npos || dot <= name) return text.size();
     std::u16string_view const extension = text.substr(dot + 1);
     bool const known = !extension.empty() && extension.size() <= kLongestExtension &&

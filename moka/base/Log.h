@@ -11,9 +11,9 @@ class String;
 
 class MOKA_API Log {
 public:
-    /// The text as it may be logged: unchanged in an engineering build; otherwise only the slashes and the
-    /// extension (one to five ASCII letters or digits after the last dot) are kept, every other character
-    /// becomes '*'. UTF-8.
+    /// Returns the text in a form that may be logged, in UTF-8. In engineering builds the text is unchanged.
+    /// In others, every character becomes '*', except the slashes and the extension (one to five ASCII
+    /// letters or digits after the last dot).
     static std::string ConvertSecureLog(String const& text);
 };
 

@@ -26,7 +26,7 @@ void Call(HandlerState const& target, int what) {
     }
 }
 
-// lock holds the queue's mutex and is let go while the message runs.
+// Runs the first message. lock holds the queue's mutex and is released while the message runs.
 void RunFirst(MessageQueue& queue, std::unique_lock<std::mutex>& lock) {
     Message const message = std::move(queue.messages.front());
     queue.messages.pop_front();
@@ -49,7 +49,8 @@ MessageLoop::MessageLoop() : mQueue(std::make_shared<MessageQueue>()) {
 MessageLoop::~MessageLoop() {
     MOKA_CHECK(currentLoop == this, "a MessageLoop is destroyed by the thread that made it");
     currentLoop = nullptr;
-    std::list<Message> dropped; // freed after the lock: the last message may own its handler's state
+    std::list<Message>
+        dropped; // destroyed after the lock is released, because messages may own the state of a handler
     std::lock_guard<std::mutex> const lock(mQueue->mutex);
     mQueue->closed = true;
     mQueue->messages.swap(dropped);
@@ -83,7 +84,7 @@ int MessageLoop::RunPending() {
 }
 
 void MessageLoop::Quit() {
-    auto const queue = mQueue; // the loop may be gone as soon as the flag is seen
+    auto const queue = mQueue; // the loop may be destroyed as soon as its thread sees the flag
     {
         std::lock_guard<std::mutex> const lock(queue->mutex);
         queue->quit = true;

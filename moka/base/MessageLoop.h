@@ -1,7 +1,6 @@
-/// MessageLoop: runs the messages of the Handlers that one thread created.
-/// Owner:  the thread that constructs it; at most one a thread, found with GetCurrent().
-/// Thread: Run, RunPending and destruction on the owning thread; Quit and the posting side of Handler from
-///         any.
+/// MessageLoop: runs the messages of all Handlers that were created on its thread.
+/// Owner:  the thread that creates it. A thread has at most one; GetCurrent() returns it.
+/// Thread: Run, RunPending and destruction on the owning thread; Quit on any thread.
 /// Fails:  an exception of a message is logged as an error, and the loop continues.
 #pragma once
 
@@ -19,20 +18,21 @@ struct MessageQueue;
 class MOKA_API MessageLoop : NonAssignable {
 public:
     MessageLoop();
-    /// Messages that have not run are dropped.
+    /// Drops messages that have not run.
     ~MessageLoop();
 
-    /// The calling thread's loop; null when it has none.
+    /// The calling thread's loop, or null.
     static MessageLoop* GetCurrent();
 
-    /// Runs messages in the order they were sent until Quit. A message may call it, or RunPending, again.
+    /// Runs messages in the order in which they were sent, until Quit. A message may call Run or RunPending
+    /// again.
     void Run();
 
     /// Runs the messages that are pending now and returns their number. Messages that they send run later.
     int RunPending();
 
-    /// Makes Run return after the message it is running; the innermost one, if several are. When none is, the
-    /// next one returns at once.
+    /// Makes Run return after the current message. If several calls of Run are nested, the innermost one
+    /// returns. If none is running, the next call returns at once.
     void Quit();
 
 private:

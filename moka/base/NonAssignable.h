@@ -1,4 +1,4 @@
-// NonAssignable: base of classes that are neither copied nor assigned.
+// NonAssignable: a base class that prevents copying and assignment.
 #pragma once
 
 namespace Moka {

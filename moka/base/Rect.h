@@ -25,8 +25,8 @@ public:
     /// From its edges.
     constexpr Rect(int l, int t, int r, int b) : left(l), top(t), right(r), bottom(b) {}
 
-    /// The smallest integer rectangle around r: left and top rounded down, right and bottom up, each saturated
-    /// to the range of int. A NaN edge becomes 0.
+    /// Converts to the smallest enclosing integer rectangle: left and top are rounded down, right and bottom
+    /// up, each saturated to the range of int. A NaN edge becomes 0.
     explicit Rect(RectF const& r);
     Rect& operator=(RectF const& r);
 
@@ -36,9 +36,9 @@ public:
 
     bool Contains(Point const& p) const; ///< left <= x < right and top <= y < bottom
 
-    /// Whether the two share at least one pixel.
+    /// True if the rectangles share at least one pixel.
     bool IsIntersect(Rect const& other) const;
-    /// The shared pixels; a default (all zero) rectangle when there are none.
+    /// The shared pixels; a default (all zero) rectangle if there are none.
     Rect Intersect(Rect const& other) const;
 
     /// Compares the edges.
@@ -73,11 +73,11 @@ public:
     /// Differences of the edges; may be negative.
     float GetWidth() const { return right - left; }
     float GetHeight() const { return bottom - top; }
-    /// Width or height is not positive, or not a number.
+    /// True if width or height is not positive, or NaN.
     bool IsEmpty() const { return !(left < right && top < bottom); }
 
-    /// Grows the rectangle so that it contains (x, y); start from a degenerate rectangle at the first point.
-    /// A coordinate that is NaN changes nothing.
+    /// Grows the rectangle so that it contains (x, y). To enclose points, start with an empty rectangle at
+    /// the first one. A NaN coordinate changes nothing.
     void MakeRect(float x, float y) {
         if (x < left) left = x;
         if (x > right) right = x;
@@ -88,12 +88,13 @@ public:
     /// Rounds outwards to whole numbers: left and top down, right and bottom up.
     void ExtendRect();
 
-    /// Moves every edge outwards by the given distances (inwards when negative).
+    /// Moves every edge outwards by these distances, or inwards if they are negative.
     void IncreaseRect(float dx, float dy) { Set(left - dx, top - dy, right + dx, bottom + dy); }
 
-    /// Per axis, with lo the greater of the low edges and hi the lesser of the high ones: overlap when lo <
-    /// hi, or when lo == hi and one of the two has no extent on that axis. So horizontal and vertical lines
-    /// count, a full rectangle that ends exactly on the other's edge does not. NaN never intersects.
+    /// True if the rectangles overlap on both axes. Let lo be the greater of the low edges on an axis, and hi
+    /// the lesser of the high edges. They overlap if lo < hi, or if lo == hi and one of them has size 0 on
+    /// that axis. So horizontal and vertical lines count, but a rectangle that ends exactly at the other's
+    /// edge does not. NaN never overlaps.
     bool IsIntersect(RectF const& other) const {
         return OverlapsOnAxis(left, right, other.left, other.right) &&
                OverlapsOnAxis(top, bottom, other.top, other.bottom);

@@ -7,7 +7,7 @@ namespace Moka {
 RefCount::~RefCount() = default;
 
 int RefCount::Ref() noexcept {
-    // Whoever takes a reference already reaches the object through another one, so nothing is ordered here.
+    // Relaxed, because the caller already has access to the object through another reference.
     int const before = mCount.fetch_add(1, std::memory_order_relaxed);
     MOKA_CHECK(before > 0, "Ref of an object whose last reference is gone");
     return before + 1;

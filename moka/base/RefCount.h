@@ -1,5 +1,5 @@
-/// RefCount: an atomic reference count that deletes its object when the last reference goes.
-/// Owner:   starts at one, which belongs to the creator.
+/// RefCount: an atomic reference count that deletes its object when the last reference is dropped.
+/// Owner:   the count starts at one, for the creator.
 /// Thread:  any. The last Unref sees everything that other threads did before theirs.
 /// Usable as a public, private or second base: the object is deleted through the virtual destructor.
 #pragma once
@@ -17,11 +17,12 @@ public:
     RefCount& operator=(RefCount const&) = delete;
     virtual ~RefCount();
 
-    /// Both return the count after the operation. After an Unref that returned 0 the object is gone.
+    /// Take or drop a reference, and return the count afterwards. If Unref returns 0, the object has been
+    /// deleted.
     int Ref() noexcept;
     int Unref();
 
-    /// A snapshot; only a caller that knows nobody else holds a reference can rely on it.
+    /// A snapshot of the count. Other threads may change it at any time.
     int GetRefCount() const noexcept;
 
 private:

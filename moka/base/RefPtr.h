@@ -1,5 +1,5 @@
-/// RefPtr: holds one reference on an object with Ref() and Unref().
-/// Adopt takes over a reference of the caller's, Share takes a new one.
+/// RefPtr: a pointer that holds one reference on an object with Ref() and Unref().
+/// Adopt uses a reference that the caller has; Share takes a new one.
 #pragma once
 
 #include <utility>
@@ -10,7 +10,7 @@ template <class T>
 class RefPtr {
 public:
     RefPtr() noexcept = default;
-    /// A copy holds a reference of its own; a move takes it over.
+    /// A copy takes a new reference; a move transfers it.
     RefPtr(RefPtr const& other) : mObject(other.mObject) {
         if (mObject) mObject->Ref();
     }
@@ -23,7 +23,7 @@ public:
         if (mObject) mObject->Unref();
     }
 
-    /// Takes over a reference that the caller has. Null makes an empty pointer.
+    /// Takes ownership of a reference that the caller has. Null makes an empty pointer.
     static RefPtr Adopt(T* object) noexcept {
         RefPtr pointer;
         pointer.mObject = object;
@@ -41,7 +41,7 @@ public:
     T& operator*() const noexcept { return *mObject; }
     explicit operator bool() const noexcept { return mObject != nullptr; }
 
-    /// Gives the reference up to the caller.
+    /// Makes the pointer empty and returns the object. The caller then owns the reference.
     [[nodiscard]] T* Release() noexcept { return std::exchange(mObject, nullptr); }
 
 private:

@@ -1,5 +1,5 @@
-// RunGuarded: calls what somebody else wrote, on a thread that must go on afterwards.
-// Fails:  what it throws is one error line, and false.
+// RunGuarded: calls a function of the application on a thread that must survive its exceptions.
+// Fails:  if the function throws, logs an error and returns false.
 #pragma once
 
 #include "moka/base/log/AndroidLog.h"
@@ -8,7 +8,7 @@
 
 namespace Moka {
 
-// The line stands under tag and begins with who.
+// The log line has this tag and begins with who.
 template <class Function>
 bool RunGuarded(char const* tag, char const* who, Function const& function) {
     try {

@@ -1,4 +1,5 @@
-// SameBits.h: compares small blocks of memory where the call of memcmp would take longer than the comparison.
+// SameBits.h: compares small blocks of memory in line, because a call of memcmp takes longer than the
+// comparison.
 #pragma once
 
 #include <cstddef>
@@ -7,17 +8,18 @@
 
 namespace Moka::detail {
 
-/// A word of memory that may hold anything, at any address.
+/// 8 bytes of an object of any type, at any alignment.
 using AnyWord = std::uint64_t __attribute__((may_alias, aligned(1)));
 
-/// One expression, not a loop: compilers would make a loop load two words at once. Those were often stored one by
-/// one a moment ago, and such a load waits until they have left the processor.
+/// This is one expression because compilers vectorise a loop to 16-byte loads. If two separate 8-byte stores
+/// wrote these bytes just before, the load stalls until both have left the store buffer (no store
+/// forwarding).
 template <std::size_t... kIndices>
 bool HasSameWords(AnyWord const* a, AnyWord const* b, std::index_sequence<kIndices...>) {
     return ((a[kIndices] ^ b[kIndices]) | ...) == 0;
 }
 
-/// Whether the first kBytes, a multiple of 8, of a and b are equal bit by bit.
+/// Returns true if the first kBytes bytes of a and b are equal. kBytes is a multiple of 8.
 template <std::size_t kBytes>
 bool HasSameBits(void const* a, void const* b) {
     static_assert(kBytes % sizeof(std::uint64_t) == 0);

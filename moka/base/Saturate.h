@@ -1,4 +1,4 @@
-// Saturate.h: numbers to int, the nearest one for what does not fit.
+// Saturate.h: converts numbers to int. Numbers outside the range of int become the nearest int.
 #pragma once
 
 #include <algorithm>
@@ -13,10 +13,10 @@ inline int Saturate(std::int64_t value) {
         std::clamp<std::int64_t>(value, std::numeric_limits<int>::min(), std::numeric_limits<int>::max()));
 }
 
-// Towards zero; NaN becomes 0.
+// Rounds towards zero. NaN becomes 0.
 inline int Saturate(float value) {
     if (std::isnan(value)) return 0;
-    // The greatest int has no float of its own; the next float up is the first that does not fit.
+    // The greatest int is not a float. 2^31 is the smallest float that does not fit.
     if (value >= 2147483648.0f) return std::numeric_limits<int>::max();
     if (value <= -2147483648.0f) return std::numeric_limits<int>::min();
     return static_cast<int>(value);

@@ -1,8 +1,7 @@
-/// String: UTF-16 text, as the platform's Java side hands it over, with UTF-8 conversion both ways.
-/// Default construction allocates nothing. Malformed input is kept going: a lone surrogate, and every
-/// malformed UTF-8 sequence, becomes U+FFFD on conversion.
-/// Thread: a value type; not synchronised.
-/// Fails:  std::bad_alloc when memory is out, as the standard strings do.
+/// String: UTF-16 text, as Java uses it, with conversion from and to UTF-8. Default construction allocates
+/// nothing. Lone surrogates and malformed UTF-8 sequences become U+FFFD on conversion.
+/// Thread: a value; not synchronised.
+/// Fails:  throws std::bad_alloc if memory runs out, as standard strings do.
 #pragma once
 
 #include "moka/base/Export.h"
@@ -16,7 +15,7 @@ public:
     String() = default;
     String(char const* utf8);        ///< null is the empty string
     String(std::string const& utf8); ///< may contain zeros
-    /// length UTF-16 units of text.
+    /// Copies length UTF-16 units of text.
     String(char16_t const* text, int length);
 
     int GetLength() const; ///< in UTF-16 units
@@ -26,31 +25,31 @@ public:
     /// Makes the string empty.
     void Clear();
 
-    /// Puts the units from start on (at most count of them) into result, which may be this string. False, with
-    /// result untouched, when start is outside 0 ... length, count is negative or result is null.
+    /// Copies the units from start on, at most count of them, to result, which may be this string. Returns
+    /// false and changes nothing if start is outside 0 ... length, count is negative, or result is null.
     bool SubString(int start, String* result) const;
     bool SubString(int start, int count, String* result) const;
 
-    /// The position of the last occurrence of text, -1 when there is none. An empty text is found at the end.
+    /// Returns the position of the last occurrence of text, or -1. An empty text is found at the end.
     int ReverseFind(String const& text) const;
 
-    /// 0 when equal; otherwise negative or positive by the first differing unit. Case-sensitive.
+    /// Compares units, including case. Returns 0 if the texts are equal, else a negative or positive number.
     int CompareTo(String const& other) const;
 
-    /// Adds other at the end.
+    /// Appends other.
     String& Append(String const& other);
 
     /// The text as UTF-8.
     std::string ToUtf8() const;
 
-    /// Names of files, which a system takes as bytes, whether they are UTF-8 or not. Each byte that is no UTF-8
-    /// becomes a lone surrogate, U+DC80 to U+DCFF, and a byte again; all else as with UTF-8.
+    /// Convert file names, which are bytes and need not be UTF-8. Each byte that is not part of valid UTF-8
+    /// becomes a lone surrogate, U+DC80 to U+DCFF, which is converted back to the same byte.
     static String FromFileName(std::string const& bytes);
     std::string ToFileName() const;
 
-    /// Copies at most maxBytes of UTF-8 into buffer, cut at a character boundary, and terminates it: buffer
-    /// needs room for maxBytes + 1. Returns the bytes copied, without the terminator; -1 and no change when
-    /// buffer is null or maxBytes negative.
+    /// Copies at most maxBytes of UTF-8 to buffer, cut at a character boundary, and a terminating zero:
+    /// buffer needs maxBytes + 1 bytes. Returns the number of bytes without the zero. Returns -1 and changes
+    /// nothing if buffer is null or maxBytes is negative.
     int ToUtf8(char* buffer, int maxBytes) const;
 
     /// Compares the units.

@@ -1,4 +1,4 @@
-/// System: facts about the build that the host sets once.
+/// System: properties of the build, which the host sets once.
 /// Thread: any (atomic).
 #pragma once
 
@@ -8,7 +8,7 @@ namespace Moka {
 
 class MOKA_API System {
 public:
-    /// Whether this is an engineering build, which may print file paths. False until set.
+    /// True in an engineering build, which may log file paths. The default is false.
     static bool IsBuildTypeEngMode();
     static void SetBuildTypeEngMode(bool on);
 };

@@ -1,4 +1,4 @@
-// Tag: a label of at most 126 bytes, for logs and debuggers. The limit is one byte less than would fit.
+// Tag: a label of at most 126 bytes, for logs and debuggers. The buffer would have room for one byte more.
 // Compat: tag-limit
 #pragma once
 
@@ -9,11 +9,11 @@ namespace Moka {
 
 class Tag {
 public:
-    // Null is ignored; a tag may be set to itself.
+    // Null is ignored. text may be Get().
     void Set(char const* text) {
         if (text) mText[Write(text)] = '\0';
     }
-    // The same without a terminator: the end of an earlier, longer text stays. // Compat: tag-tail
+    // Like Set, but writes no terminating zero: the end of an earlier, longer text stays. // Compat: tag-tail
     void Overwrite(char const* text) {
         if (text) Write(text);
     }
@@ -28,7 +28,7 @@ private:
         return length;
     }
 
-    char mText[kMaxLength + 2] = {}; // what is behind the limit stays zero
+    char mText[kMaxLength + 2] = {}; // the bytes after the limit stay zero
 };
 
 } // namespace Moka

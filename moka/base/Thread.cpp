@@ -14,7 +14,8 @@
 namespace Moka {
 namespace {
 
-// The longest part of name that has at most maxBytes and cuts no UTF-8 character.
+// Returns the length of the longest beginning of name that has at most maxBytes and does not cut a UTF-8
+// character.
 std::size_t CutLength(char const* name, std::size_t maxBytes) {
     std::size_t length = strnlen(name, maxBytes + 1);
     if (length <= maxBytes) return length;
@@ -25,7 +26,7 @@ std::size_t CutLength(char const* name, std::size_t maxBytes) {
 
 void DescribeThisThread(char const* name, int priority) {
     if (*name != '\0') pthread_setname_np(pthread_self(), name);
-    // Linux gives every thread a nice value of its own, under its thread id.
+    // On Linux every thread has its own nice value, set by the thread id.
     setpriority(PRIO_PROCESS, static_cast<id_t>(gettid()), priority);
 }
 
@@ -56,7 +57,7 @@ bool Thread::Start() {
     } name;
     std::memcpy(name.text, mName, sizeof mName);
     try {
-        // The function may delete this object, so it runs only when nothing here touches the object any more.
+        // The function may delete this object. So it waits until Start no longer uses the object.
         std::promise<void> ready;
         mThread = std::thread([go = ready.get_future(), name, priority = mPriority, function = mFunction,
                                argument = mArgument]() mutable {

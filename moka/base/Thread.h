@@ -1,9 +1,9 @@
 /// Thread: a named thread that runs one function.
-/// Owner:  the creator. Destruction waits for a started thread, unless it happens on that very thread, which
-///         is then detached; so a function may delete its own Thread.
-/// Thread: Start, Join and destruction by one thread at a time.
-/// Units:  priority is a nice value, -20 (most urgent) to 19; one the system refuses is ignored. A name is
-///         UTF-8, copied, and cut to 15 bytes, the system's limit; null is no name.
+/// Owner:  the creator. The destructor waits for the thread to end. If it runs on that thread itself, it
+///         detaches it instead, so a function may delete its own Thread.
+/// Thread: Start, Join and destruction on one thread at a time.
+/// Units:  priority is a nice value, -20 (most urgent) to 19. If the system refuses it, it is ignored. name
+///         is UTF-8. It is copied and cut to 15 bytes, the system's limit. Null means no name.
 /// Fails:  an exception that leaves the function ends the process.
 #pragma once
 
@@ -23,15 +23,16 @@ public:
     Thread(Function function, void* argument, char const* name, int priority = 0);
     ~Thread();
 
-    /// False when it was started before or the system has no more threads; logs an error.
+    /// Starts the thread. Logs an error and returns false if it was started before or the system cannot
+    /// create a thread.
     bool Start();
 
-    /// Waits for the function to return; at once when the thread was never started or has been joined. On the
-    /// thread itself an error line and no wait.
+    /// Waits for the function to return. Returns at once if the thread was never started or was joined. On
+    /// the thread itself it logs an error and returns at once.
     void Join();
 
 private:
-    static constexpr int kNameBytes = 15; // what the system takes, without the terminator
+    static constexpr int kNameBytes = 15; // the system's limit, without the terminating zero
 
     Function mFunction;
     void* mArgument;

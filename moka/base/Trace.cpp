@@ -10,6 +10,7 @@
 #include <cstring>
 #include <mutex>
 #include <new>
+#include <string_view>
 #include <utility>
 #include <vector>
 
@@ -25,7 +26,7 @@ namespace {
 
 constexpr std::size_t kThreadNameBytes = 16;
 
-// Without a category: the name of a thread.
+// An event. If category is null, it sets the name of a thread.
 struct Event {
     char const* category;
     char const* name;
@@ -38,9 +39,12 @@ struct Event {
 };
 
 constexpr std::size_t kBufferedEvents = 4096;
-constexpr std::int64_t kOldest = 500'000'000; // nanoseconds until buffered events are written
+constexpr std::int64_t kOldest = 500'000'000; // nanoseconds after which buffered events are written
 
-// What is between quotes. Names of threads may be anything.
+constexpr std::string_view kSeparator = ",\n";
+constexpr std::string_view kEnd = "\n]\n";
+
+// Appends a JSON string. Thread names may contain any bytes.
 void AppendText(std::string& out, char const* text) {
     out += '"';
     for (; *text; ++text) {
@@ -98,7 +102,8 @@ void AppendName(std::string& out, char const* what, int thread, char const* name
     out += "}}";
 }
 
-// The file. Whole blocks or nothing: a write that fails is cut off again, so that what is there can be read.
+// The trace file. If a write fails, the file is truncated after the last complete event that leaves room for
+// the closing bracket, so that it stays readable.
 class TraceFile {
 public:
     bool Open(std::string const& path) {
@@ -112,15 +117,20 @@ public:
     std::string const& GetPath() const { return mPath; }
     std::string const& GetFailure() const { return mFailure; }
 
-    // False once; what comes later is dropped without a word.
+    // Returns false at the first failure. Later blocks are dropped silently. Each event of a block begins
+    // with kSeparator.
     bool Write(std::string const& block) {
         if (!mFailure.empty()) return true;
         std::size_t done = 0;
         while (done < block.size()) {
             ssize_t const written = write(mFile, block.data() + done, block.size() - done);
             if (written < 0 && errno == EINTR) continue;
-            if (written <= 0)
-                return Fail(written < 0 ? std::strerror(errno) : "the file takes no more bytes");
+            if (written <= 0) {
+                char const* const reason =
+                    written < 0 ? std::strerror(errno) : "the file takes no more bytes";
+                mBytes += CountWhole(block, done);
+                return Fail(reason);
+            }
             done += static_cast<std::size_t>(written);
         }
         mBytes += static_cast<off_t>(done);
@@ -128,9 +138,8 @@ public:
     }
 
     void Close() {
-        // Not through Write: after a failure there may be room for the end all the same.
-        char const end[] = "\n]\n";
-        if (write(mFile, end, sizeof end - 1) != sizeof end - 1 && mFailure.empty())
+        // Does not use Write: after a failure there may still be room for these few bytes.
+        if (write(mFile, kEnd.data(), kEnd.size()) != static_cast<ssize_t>(kEnd.size()) && mFailure.empty())
             mFailure = std::strerror(errno);
         if (close(mFile) != 0 && mFailure.empty()) mFailure = std::strerror(errno);
         mFile = -1;
@@ -143,6 +152,12 @@ public:
     }
 
 private:
+    // Bytes of a block up to the end of the last event that was written with room for the file's end.
+    static off_t CountWhole(std::string const& block, std::size_t written) {
+        std::size_t const whole = block.rfind(kSeparator, written - std::min(written, kEnd.size()));
+        return whole == std::string::npos ? 0 : static_cast<off_t>(whole);
+    }
+
     int mFile = -1;
     std::string mPath;
     off_t mBytes = 0;
@@ -157,7 +172,7 @@ int GetThreadNumber() {
 class Writer {
 public:
     static Writer& Get(std::atomic<bool>& isOn) {
-        // Never destroyed: threads may trace until the process is gone.
+        // Never destroyed, because threads may trace until the process has ended.
         static Writer& writer = *new Writer(isOn);
         return writer;
     }
@@ -175,8 +190,8 @@ private:
 
     std::atomic<bool>& mIsOn;
 
-    // The file and what is on its way there. Taken before the buffer's lock is given back, so that Stop finds no
-    // events between the two.
+    // Guards the file and the events that are being written. It is locked before the buffer's lock is
+    // released, so that Stop does not miss events between the two.
     std::mutex mFileLock;
     TraceFile mFile;
     std::vector<Event> mWriting;
@@ -186,12 +201,18 @@ private:
     std::vector<Event> mEvents;
     std::int64_t mStart = 0;
     std::int64_t mLastWritten = 0;
-    // Of the trace; a thread that has not seen it yet tells its name.
+    // The number of the trace. A thread that sees a new number adds an event with its name.
     unsigned mNumber = 0;
 };
 
 thread_local unsigned theNamedIn = 0;
-thread_local char const* theTaskName = nullptr;
+
+// Of the task at hand and of the one before.
+struct TaskNames {
+    Trace::TaskName current;
+    char const* last;
+};
+thread_local TaskNames theTaskNames{};
 
 void StopAtExit() { Trace::Stop(nullptr); }
 
@@ -257,11 +278,12 @@ void Writer::Add(Event const& event) noexcept {
         mEvents.push_back(name);
     }
     mEvents.push_back(event);
-    bool const isFull = mEvents.size() + 2 > kBufferedEvents; // the next event may bring a name
+    bool const isFull =
+        mEvents.size() + 2 > kBufferedEvents; // the next event may need another one for the name
     if (isFull || event.end - mLastWritten > kOldest) WriteOut(buffer);
 }
 
-// Gives the buffer's lock back as soon as the file's is held. The log's sink is called without either.
+// Releases the buffer's lock as soon as it holds the file's lock. Logs without either lock.
 void Writer::WriteOut(std::unique_lock<std::mutex>& buffer) noexcept {
     std::unique_lock<std::mutex> file(mFileLock);
     mWriting.clear();
@@ -290,7 +312,7 @@ bool Writer::WriteEvents(std::int64_t start) noexcept {
 void Writer::Format(std::int64_t start) {
     mText.clear();
     for (Event const& event : mWriting) {
-        mText += ",\n";
+        mText += kSeparator;
         if (event.category) {
             AppendEvent(mText, event, start);
         } else {
@@ -326,10 +348,17 @@ void Trace::Add(char const* category, char const* name, std::int64_t begin, std:
     Writer::Get(theIsOn).Add(event);
 }
 
-char const* Trace::TakeTaskName() noexcept { return std::exchange(theTaskName, nullptr); }
+Trace::TaskName Trace::TakeTaskName() noexcept {
+    TaskNames& names = theTaskNames;
+    names.last = names.current.name;
+    return {std::exchange(names.current.name, nullptr), names.current.changed};
+}
 
 void Trace::SetTaskName(char const* name) noexcept {
-    if (!theTaskName) theTaskName = name;
+    TaskNames& names = theTaskNames;
+    if (names.current.name) return;
+    names.current.name = name;
+    if (name != names.last) names.current.changed = GetTime();
 }
 
 } // namespace Moka

@@ -1,15 +1,17 @@
 /// Trace: records the work of each thread and its duration, in a file in the JSON event format that
 /// Perfetto and Chrome's about:tracing read. One trace at a time in a process, off until started.
-/// Thread:  any. A row of the picture is a thread, under the name that the system has for it.
-/// Units:   the file counts microseconds from the start of the trace; times here are nanoseconds of the
-///          steady clock.
-/// Cost:    off, one relaxed load for each event. On, two readings of the clock and a short lock; whichever
-///          thread fills the buffer, or finds it older than half a second, writes it out.
-/// Text:    every `char const*` must stay valid until the trace has stopped; string literals do.
-/// Fails:   a file that cannot be opened is false with the reason. When writing fails later, one warning is
-///          logged, the file is cut after the last event that fits, and tracing stops; the program goes on.
-/// Lost:    nothing that ended before Stop() or the normal end of the process. A scope that is open then is
-///          not in the file.
+/// Thread:  any. The viewers show one row for each thread, with the thread's system name.
+/// Units:   the file has microseconds since the start of the trace; times here are nanoseconds of the steady
+///          clock.
+/// Cost:    while it is off, one relaxed load for each event. While it is on, the clock is read twice, and a
+///          lock is held briefly. The thread that fills the buffer, or finds it older than half a second,
+///          writes it to the file.
+/// Text:    every `char const*` must stay valid until the trace has stopped, as string literals do.
+/// Fails:   Start returns false and the reason if the file cannot be opened. If writing fails later, it logs
+///          a warning, truncates the file after the last event that fits, and stops tracing.
+/// Lost:    scopes that are still open at Stop() or at the exit of the process, and the last tasks of one
+/// kind of
+///          a queue that still runs. All earlier events are in the file.
 #pragma once
 
 #include "moka/base/Export.h"
@@ -21,12 +23,12 @@
 
 namespace Moka {
 
-/// A named number or text of an event.
+/// An argument of an event: a name with a number or a text.
 struct TraceArgument {
-    /// The name, and the number unless text is set.
+    /// The name, and the number.
     char const* key;
     std::int64_t number;
-    char const* text; ///< in the place of the number unless null
+    char const* text; ///< replaces the number unless it is null
 };
 
 class MOKA_API Trace {
@@ -34,36 +36,42 @@ public:
     /// The most arguments of one event.
     static constexpr int kMaxArguments = 4;
 
-    /// Replaces the file. False, with the reason, when it cannot be opened or a trace is running. error may
-    /// be null.
+    /// Starts a trace, and replaces the file. Returns false and sets *error if the file cannot be opened or a
+    /// trace is running. error may be null.
     static bool Start(std::string const& path, std::string* error);
-    /// Writes the remaining events and closes the file. False, with the reason, when a part could not be
-    /// written. Without a trace it does nothing: true. The end of the process stops the trace, too.
+    /// Writes the remaining events and closes the file. Returns false and sets *error if a part could not be
+    /// written. Without a trace it does nothing and returns true. The normal exit of the process stops the
+    /// trace as well.
     static bool Stop(std::string* error);
 
-    /// Whether a trace is running.
+    /// True while a trace is running.
     static bool IsOn() noexcept { return theIsOn.load(std::memory_order_relaxed); }
 
     /// Nanoseconds of the steady clock.
     static std::int64_t GetTime() noexcept;
-    /// An event of this thread. Ignored when it began before the trace. Of more arguments than kMaxArguments
-    /// the first are taken.
+    /// Adds an event of this thread. Ignores it if it began before the trace. Uses the first kMaxArguments
+    /// arguments.
     static void Add(char const* category, char const* name, std::int64_t begin, std::int64_t end,
                     TraceArgument const* arguments, std::size_t count) noexcept;
 
-    /// Names the task that this thread runs, for the queue that runs it. The first name counts.
+    /// Sets the name of the task that this thread is running, for the queue. The first call of a task counts.
     static void NameTask(char const* name) noexcept {
         if (IsOn()) SetTaskName(name);
     }
-    /// The name given since the last call, or null.
-    static char const* TakeTaskName() noexcept;
+    /// A task's name and the time at which it became the name.
+    struct TaskName {
+        char const* name;     ///< the name that was set since the last call, or null
+        std::int64_t changed; ///< the time at which it was set, if it differs from the previous name
+    };
+    /// Returns the name that was set since the last call. A queue calls it after each task.
+    static TaskName TakeTaskName() noexcept;
 
 private:
     static void SetTaskName(char const* name) noexcept;
     static std::atomic<bool> theIsOn;
 };
 
-/// An event from here to the end of the scope.
+/// Adds an event that lasts from the constructor to the destructor.
 class TraceScope {
 public:
     // cppcheck-suppress uninitMemberVar ; only mIsOn is written while the trace is off

@@ -6,10 +6,10 @@ namespace {
 constexpr char16_t kReplacement = 0xfffd;
 constexpr char32_t kMalformed = 0xffffffff;
 
-// What a first byte promises: the length of the character and the range of the second byte. The ranges that
-// are narrower than 0x80 ... 0xbf keep out overlong forms, surrogates and what lies above U+10FFFF.
+// The length of a character and the range of its second byte, which its first byte determines. Ranges
+// narrower than 0x80 ... 0xbf exclude overlong forms, surrogates and code points above U+10FFFF.
 struct Lead {
-    std::size_t length; // 0: no character starts so
+    std::size_t length; // 0: no character starts with this byte
     unsigned char secondLow = 0x80;
     unsigned char secondHigh = 0xbf;
 };
@@ -52,11 +52,11 @@ constexpr bool IsLowSurrogate(char16_t unit) { return (unit & 0xfc00) == 0xdc00;
 
 namespace {
 
-// handleMalformed gets the bytes that begin no character.
+// Calls handleMalformed for bytes that do not form a character.
 template <class HandleMalformed>
 std::u16string Convert(std::string_view utf8, HandleMalformed const& handleMalformed) {
     std::u16string text;
-    text.reserve(utf8.size()); // never too small: no byte makes more than one unit
+    text.reserve(utf8.size()); // always enough, because a byte makes at most one unit
     for (std::size_t position = 0; position < utf8.size();) {
         std::size_t const start = position;
         char32_t const codePoint = NextCodePoint(utf8, position);

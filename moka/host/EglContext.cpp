@@ -78,7 +78,7 @@ bool EglContext::BuildOffscreen(EglRequest const& request) {
     return MakeCurrent();
 }
 
-// The window decides which configuration fits; only trying tells.
+// Tries each configuration, because EGL does not report which one fits the window.
 bool EglContext::BuildInWindow(EglRequest const& request) {
     if (!ChooseConfig(EGL_WINDOW_BIT) || !CreateWindowSurface(request.window)) return false;
     mPath += ", window";
@@ -101,7 +101,8 @@ bool EglContext::SwapBuffers() {
 }
 
 bool EglContext::Initialize() {
-    // EGL does not count: a display that somebody in this process has initialised already must outlive us.
+    // EGL does not count initialisations. So a display that other code has initialised must not be terminated
+    // here.
     bool const foreign = eglQueryString(mDisplay, EGL_VERSION) != nullptr;
     if (!eglInitialize(mDisplay, &mMajor, &mMinor)) return Fail("eglInitialize");
     mInitialized = !foreign;
@@ -111,7 +112,7 @@ bool EglContext::Initialize() {
 }
 
 bool EglContext::ChooseConfig(EGLint surfaceType) {
-    // A window need not be translucent.
+    // A window needs no alpha.
     bool const isWindow = surfaceType == EGL_WINDOW_BIT;
     // clang-format off
     EGLint const wanted[] = {
@@ -129,7 +130,7 @@ bool EglContext::ChooseConfig(EGLint surfaceType) {
     mCandidates.resize(static_cast<std::size_t>(count));
     if (!eglChooseConfig(mDisplay, wanted, mCandidates.data(), count, &count)) return Fail("eglChooseConfig");
     mCandidates.resize(static_cast<std::size_t>(count));
-    // The sizes asked for are the least, and more bits come first.
+    // eglChooseConfig treats sizes as minima and returns larger ones first.
     auto const isUnfit = [this, isWindow](EGLConfig config) {
         for (EGLint const channel : {EGL_RED_SIZE, EGL_GREEN_SIZE, EGL_BLUE_SIZE}) {
             if (GetBits(config, channel) != 8) return true;
@@ -160,7 +161,7 @@ bool EglContext::CreateContext(bool debug) {
     } else if (debug && HasEglExtension(eglQueryString(mDisplay, EGL_EXTENSIONS), "EGL_KHR_create_context")) {
         mContext = TryContext(EGL_CONTEXT_FLAGS_KHR, EGL_CONTEXT_OPENGL_DEBUG_BIT_KHR);
     }
-    // A driver without debug contexts still draws.
+    // A driver may lack debug contexts; fall back to a plain one.
     if (mContext == EGL_NO_CONTEXT) mContext = TryContext(EGL_NONE, EGL_NONE);
     return mContext != EGL_NO_CONTEXT || Fail("eglCreateContext");
 }
@@ -175,7 +176,8 @@ bool EglContext::CreatePbuffer(EglRequest const& request) {
 bool EglContext::CreateWindowSurface(std::uintptr_t window) {
     for (EGLConfig const candidate : mCandidates) {
         mConfig = candidate;
-        // A pointer or a number, as the window system has it: only this cast suits both.
+        // The type is a pointer or a number, depending on the window system. Only a C-style cast converts to
+        // both.
         mSurface = eglCreateWindowSurface(mDisplay, mConfig, (EGLNativeWindowType)window, nullptr);
         if (mSurface != EGL_NO_SURFACE) return true;
     }

@@ -1,6 +1,8 @@
 // EglContext: an OpenGL ES 3 context that is current on the thread that opened it.
-// Owner:   that thread, which also destroys it: the context stops being current and everything is given back.
-// Fails:   Open returns null and says what was tried, with EGL's own error names, and what to install.
+// Owner:   that thread, which also destroys it. The destructor makes the context not current and frees all
+//          EGL objects.
+// Fails:   Open returns null. The error names the attempts with EGL's error names, and the packages to
+//          install.
 #pragma once
 
 #include "moka/host/EglPlatform.h"
@@ -17,9 +19,9 @@ namespace Moka::detail {
 
 struct EglRequest {
     bool debug = false;
-    int surfaceWidth = 1; // pixels; a side above 1 asks for a default frame buffer of that size
+    int surfaceWidth = 1; // pixels; a side above 1 requests a default frame buffer of that size
     int surfaceHeight = 1;
-    // A window of the window system's, which is the default frame buffer then; 0 for none.
+    // A native window, whose frame buffer becomes the default one; 0 for none.
     std::uintptr_t window = 0;
     void* windowDisplay = nullptr;
     int swapInterval = 1; // of the window
@@ -32,22 +34,22 @@ public:
     EglContext(EglContext const&) = delete;
     EglContext& operator=(EglContext const&) = delete;
 
-    // How it was reached: "EGL surfaceless platform, pbuffer 640 x 480".
+    // The platform and the surface: "EGL surfaceless platform, pbuffer 640 x 480".
     std::string const& GetPath() const { return mPath; }
     std::string const& GetVersion() const { return mVersion; }
 
-    // Shows what was drawn into the window's frame buffer. False, with one error line, when the window is gone or
-    // EGL refuses.
+    // Shows the window's frame buffer. If the window no longer exists or EGL fails, logs an error and returns
+    // false.
     bool SwapBuffers();
 
 private:
     explicit EglContext(EglPlatform const& platform);
-    // Null, with the reason, when there is no such window.
+    // If there is no such window, returns null and sets *error.
     static std::unique_ptr<EglContext> OpenInWindow(EglRequest const& request, std::string* error);
     static std::unique_ptr<EglContext> OpenOneOf(std::vector<EglPlatform> const& platforms,
                                                  EglRequest const& request, std::string* error);
 
-    // Each false with mFailure set.
+    // On failure each of these sets mFailure and returns false.
     bool Build(EglRequest const& request);
     bool Initialize();
     bool ChooseConfig(EGLint surfaceType);
@@ -63,9 +65,9 @@ private:
     EGLint GetBits(EGLConfig config, EGLint channel) const;
     bool IsAtLeast15() const { return mMajor > 1 || (mMajor == 1 && mMinor >= 5); }
 
-    std::unique_ptr<XWindowWatch> mWatch; // null where nothing can be known of the window
+    std::unique_ptr<XWindowWatch> mWatch; // null if the state of the window is unknown
     EGLDisplay mDisplay;
-    bool mInitialized = false; // by us, so terminated by us
+    bool mInitialized = false; // this object initialised the display and must terminate it
     EGLint mMajor = 0;
     EGLint mMinor = 0;
     std::vector<EGLConfig> mCandidates;

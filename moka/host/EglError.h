@@ -1,4 +1,4 @@
-// EglError: what EGL says went wrong, as text for a message.
+// EglError: EGL errors as text for messages.
 #pragma once
 
 #include <EGL/egl.h>
@@ -7,10 +7,11 @@
 
 namespace Moka::detail {
 
-// The name in the headers, or the number when it has none.
+// Returns the name of the error code, or the number if it has no name.
 std::string NameOfEglError(EGLint error);
 
-// "eglInitialize: EGL_NOT_INITIALIZED", with this thread's last error, which is thereby forgotten.
+// Returns "eglInitialize: EGL_NOT_INITIALIZED", for example, with the last error of this thread. Resets that
+// error.
 std::string DescribeEglFailure(char const* function);
 
 } // namespace Moka::detail

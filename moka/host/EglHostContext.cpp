@@ -1,4 +1,4 @@
-// The host context over EGL.
+// Implements HostContext with EGL.
 #include "moka/host/EglContext.h"
 #include "moka/host/HostContext.h"
 #include "moka/host/RenderThread.h"

@@ -9,13 +9,13 @@
 namespace Moka::detail {
 namespace {
 
-// From EGL_ANGLE_platform_angle and its companions, which the system's header does not carry.
+// From EGL_ANGLE_platform_angle and related extensions, which the system's header does not contain.
 constexpr EGLenum kPlatformAngle = 0x3202;
 constexpr EGLint kPlatformAngleType = 0x3203;
 constexpr EGLint kPlatformAngleDeviceType = 0x3209;
 constexpr EGLint kPlatformAngleDeviceSwiftShader = 0x3487;
 constexpr EGLint kPlatformAngleVulkan = 0x3450;
-// From EGL_EXT_platform_xcb, newer than some headers.
+// From EGL_EXT_platform_xcb, which older headers do not contain.
 constexpr EGLenum kPlatformXcb = 0x31DC;
 
 template <class Function>
@@ -88,7 +88,8 @@ std::vector<EglPlatform> ListWindowPlatforms(void* xcbConnection, void* nativeDi
         platforms.push_back(Finish("XCB platform", getDisplay(kPlatformXcb, xcbConnection, nullptr),
                                    "eglGetPlatformDisplayEXT"));
     }
-    // EGL's native types are a pointer or a number, as the window system has it: only this cast suits both.
+    // EGL's native types are pointers or numbers, depending on the window system. Only a C-style cast
+    // converts to both.
     platforms.push_back(
         Finish("window system", eglGetDisplay((EGLNativeDisplayType)nativeDisplay), "eglGetDisplay"));
     return platforms;

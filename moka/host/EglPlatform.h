@@ -1,5 +1,5 @@
-// EglPlatform: the ways to an EGL display: of a window system's connection, or those that need none, best
-// first.
+// EglPlatform: lists EGL displays, best first: those of a window system's connection, or those that need no
+// window system.
 #pragma once
 
 #include <EGL/egl.h>
@@ -11,18 +11,19 @@ namespace Moka::detail {
 
 struct EglPlatform {
     std::string name;    // for a message: "device platform, device 1 of 2"
-    EGLDisplay display;  // not initialised by us; EGL_NO_DISPLAY when it could not be had
-    std::string failure; // why it could not be had
+    EGLDisplay display;  // not initialised; EGL_NO_DISPLAY if it is not available
+    std::string failure; // the reason why it is not available
 };
 
-// Only what the EGL at hand offers. Never empty: the default display stands last.
+// Returns the displays that this EGL supports without a window system. Never empty: the default display is
+// the last one.
 std::vector<EglPlatform> ListEglPlatforms();
 
-// The displays on which a window may be: the one of an xcb_connection_t, where EGL takes it and it is not null,
-// and the one of a window system's connection, for which null is the default one.
+// Returns the displays for a window: that of an xcb_connection_t, if it is not null and EGL supports it, and
+// that of a window system's connection. A null nativeDisplay is the default connection.
 std::vector<EglPlatform> ListWindowPlatforms(void* xcbConnection, void* nativeDisplay);
 
-// Whether a list as eglQueryString gives it, which may be null, has a name.
+// True if a list of extensions from eglQueryString contains name. extensions may be null.
 bool HasEglExtension(char const* extensions, char const* name);
 
 } // namespace Moka::detail

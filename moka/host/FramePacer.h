@@ -1,4 +1,5 @@
-// FramePacer: holds back whoever presents faster than the window shows, so that only so many frames wait.
+// FramePacer: makes a thread wait that presents faster than the window shows frames, to limit the frames in
+// flight.
 // Thread: any.
 #pragma once
 
@@ -13,7 +14,8 @@ class FramePacer {
 public:
     explicit FramePacer(int framesInFlight) : mLimit(framesInFlight) {}
 
-    // Counts a frame, once there is room for it. Without waiting there may be one too many.
+    // Counts a frame, after waiting until fewer than framesInFlight are counted. If mayWait is false, the
+    // limit may be exceeded.
     void Enter(bool mayWait) {
         std::unique_lock<std::mutex> lock(mMutex);
         if (mayWait && mFrames >= mLimit) Wait(lock);

@@ -1,6 +1,6 @@
-// HostContext: what a render thread owns so that the renderer works on it: a GL context and its surface, or
-// nothing over the device without a driver. Which one is decided when linking.
-// Owner:  the render thread, which opens and destroys it on itself.
+// HostContext: the GL context and the surface of a render thread, or nothing for the device without a driver.
+// The implementation is chosen at link time.
+// Owner:  the render thread, which opens and destroys it.
 #pragma once
 
 #include "moka/renderer/RendererFactory.h"
@@ -16,16 +16,16 @@ namespace Moka::detail {
 
 class HostContext {
 public:
-    // Null, with what was tried and what to install.
+    // On failure returns null; *error names the attempts and the packages to install.
     static std::unique_ptr<HostContext> Open(RenderThreadOptions const& options, std::string* error);
     virtual ~HostContext() = default;
 
-    // How it was reached: "EGL surfaceless platform, pbuffer 640 x 480".
+    // The platform and the surface: "EGL surfaceless platform, pbuffer 640 x 480".
     virtual std::string const& GetPath() const = 0;
     virtual std::string const& GetVersion() const = 0;
-    // For RendererFactory::AttachContext; may be null.
+    // The loader for RendererFactory::AttachContext; may be null.
     virtual RendererProcLoader GetLoader() const = 0;
-    // False, with one error line, when there is nothing to show it in, now and from now on.
+    // Shows the window's frame buffer. If there is no window any more, logs an error and returns false.
     virtual bool SwapBuffers() = 0;
 };
 

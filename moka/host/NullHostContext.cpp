@@ -1,4 +1,4 @@
-// The host context of the device without a driver: there is nothing to open.
+// Implements HostContext for the device without a driver.
 #include "moka/host/HostContext.h"
 #include "moka/host/RenderThread.h"
 

@@ -19,8 +19,8 @@
 namespace Moka {
 namespace {
 
-// The renderer has one context in a process. A second thread is turned away before it opens a display, since
-// closing it again would close the first one's: EGL hands both the same.
+// The renderer supports one context in a process. A second thread is refused before it opens a display: EGL
+// would return the same display, and closing it would close that of the first thread.
 class ProcessSlot {
 public:
     ProcessSlot() : mTaken(!theTaken.exchange(true)) {}
@@ -51,15 +51,16 @@ public:
 
 private:
     std::function<void()> const& mFunction;
-    std::promise<bool> mResult; // here, so that the caller that it wakes cannot destroy it at work
+    std::promise<bool> mResult; // owned here, so that the woken caller cannot destroy it while it is used
 };
 
-// A trace for as long as a render thread runs, or, when the environment asks for it, from now on.
+// Traces while a render thread runs. If MOKA_TRACE requests the trace, it lasts from the first render thread
+// on until the process ends.
 class ThreadTrace {
 public:
     explicit ThreadTrace(std::string const& path) : mIsOwn(!path.empty()) {
-        char const* const wanted = mIsOwn ? path.c_str() : std::getenv("MOKA_TRACE");
-        if (!wanted || !*wanted || (!mIsOwn && Trace::IsOn())) return;
+        char const* const wanted = mIsOwn ? path.c_str() : TakeEnvironment();
+        if (!wanted || !*wanted) return;
         std::string error;
         mIsOn = Trace::Start(wanted, &error);
         if (!mIsOn) __android_log_print(ANDROID_LOG_WARN, "mok_log", "RenderThread: %s", error.c_str());
@@ -68,12 +69,18 @@ public:
     ThreadTrace(ThreadTrace const&) = delete;
     ThreadTrace& operator=(ThreadTrace const&) = delete;
 
-    // A failure to write has its line already.
+    // Trace::Stop logs write errors itself.
     void Stop() {
         if (mIsOwn && std::exchange(mIsOn, false)) Trace::Stop(nullptr);
     }
 
 private:
+    // Once in a process: a file that could not be written or that filled the disk is told once.
+    static char const* TakeEnvironment() {
+        static std::atomic<bool> isTaken{false};
+        return Trace::IsOn() || isTaken.exchange(true) ? nullptr : std::getenv("MOKA_TRACE");
+    }
+
     bool const mIsOwn;
     bool mIsOn = false;
 };
@@ -119,7 +126,7 @@ struct RenderThread::Impl {
             context.reset();
             return started.set_value(std::move(error));
         }
-        // Nothing is shown before the queue runs empty, so the renderer may collect until then.
+        // This thread flushes whenever its queue is empty, so requests may wait until then.
         RendererFactory::SetDeferred(true);
         DescribeContext();
         started.set_value({});
@@ -128,7 +135,7 @@ struct RenderThread::Impl {
         context.reset();
     }
 
-    // On the render thread. What waits when the window goes is dropped.
+    // Runs on the render thread. If the window is destroyed, waiting frames are dropped.
     void Show() {
         Trace::NameTask("Present");
         if (isWindowGone) return;
@@ -140,7 +147,7 @@ struct RenderThread::Impl {
         isRefusalTold = true;
     }
 
-    // One line, however often it is tried and for whatever reason.
+    // Returns false. Logs the reason of the first refusal only.
     bool Refuse(char const* reason) {
         if (isRefusalTold.exchange(true)) return false;
         __android_log_print(ANDROID_LOG_ERROR, "mok_log", "RenderThread::Present: %s", reason);
@@ -167,14 +174,14 @@ struct RenderThread::Impl {
     std::atomic<bool> isRefusalTold{false};
     std::uint64_t shown = 0; // frames
     RenderContextInfo info;
-    std::unique_ptr<detail::HostContext> context; // made and destroyed on the thread
+    std::unique_ptr<detail::HostContext> context; // created and destroyed on the render thread
     std::promise<std::string> started;            // an error, or empty
     Thread thread;
 };
 
 namespace {
 
-// Shows a frame, and lets the next one come when it is freed, whether it ran or not.
+// Shows a frame. Its destructor leaves the pacer, whether the task ran or not.
 template <class Impl>
 class PresentTask final : public ITask {
 public:
@@ -190,7 +197,7 @@ private:
 
 bool RenderThread::Impl::Present() {
     if (options.nativeWindow == 0) return Refuse("there is no window; give Start a nativeWindow");
-    if (isWindowGone) return false; // told when it went
+    if (isWindowGone) return false; // logged when the window was lost
     pacer.Enter(!owner.IsConsumerThread());
     std::unique_ptr<ITask> task(new (std::nothrow) PresentTask<Impl>(*this));
     if (!task) {

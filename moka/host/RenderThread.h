@@ -1,13 +1,16 @@
 /// RenderThread: the render thread of a process without Android: one thread, one EGL context, and the queue
 /// that the graphics library posts to.
-/// Owner:   the caller of Start. Destruction stops it. One at a time in a process, since the renderer has one
-///          context; the next may start when the one before has been stopped.
-/// Thread:  Start, Stop and destruction on one thread; the rest from any.
-/// Fails:   Start returns null and a text that names the attempts and the packages to install.
-/// Driver:  linked with moka_host_null in the place of moka_host, there is none, and no GL: images are real,
-///          draws are counted and draw nothing.
-/// GL:      headless, it reaches a driver through the device platform, without a surface, or with a pbuffer,
-///          whichever answers first with OpenGL ES 3.0, RGBA8888 and a stencil; or in a window handed in.
+/// Owner:   the caller of Start. The destructor calls Stop. A process can have one at a time, because the
+///          renderer supports one context. After Stop another one may start.
+/// Thread:  Start, Stop and destruction on one thread; the other functions on any thread.
+/// Fails:   Start returns null and sets *error to a text that names the attempts and the packages to install.
+/// Driver:  if the program links moka_host_null instead of moka_host, there is no driver and no GL: images
+/// are in
+///          memory, and draws are counted but draw nothing.
+/// GL:      without a window it tries the EGL device platform, a context without a surface, and a pbuffer. It
+/// uses the
+///          first one with OpenGL ES 3.0, RGBA8888 and a stencil buffer. Or it draws in a window that you
+///          pass.
 #pragma once
 
 #include "moka/base/Export.h"
@@ -21,63 +24,65 @@
 
 namespace Moka {
 
-/// How a render thread is started. The defaults are headless.
+/// The options of a render thread. By default there is no window.
 struct RenderThreadOptions {
-    /// Lower limits than the device's.
+    /// Limits below those of the device.
     RendererLimits limits;
-    bool debugContext = false; ///< driver messages of error severity reach the log
-    /// Pixels, at least 1, of the default frame buffer. While both are 1 there need not be one.
+    bool debugContext = false; ///< creates a debug context and logs the driver's error messages
+    /// The size of the default frame buffer in pixels, at least 1. If both are 1, there may be none.
     int surfaceWidth = 1;
     int surfaceHeight = 1;
-    /// A window, whose frame buffer replaces the surface: the type that the platform's EGL
-    /// takes, an X11 Window, a wl_egl_window* or an ANativeWindow*, and the connection it belongs to (null
-    /// for the default one). Both outlive the thread. Of an X11 connection only the server's name is used,
-    /// where EGL takes a connection of ours; elsewhere two threads use it: XInitThreads. docs/windows.md
-    /// tells more.
+    /// A native window to draw in, of the type that the platform's EGL takes: an X11 Window, a wl_egl_window*
+    /// or an ANativeWindow*; and its connection to the window system (null for the default one). Both must
+    /// outlive the thread. For X11, usually only the server's name is taken from the connection. If EGL
+    /// cannot use another connection, two threads use yours: call XInitThreads first. See docs/windows.md.
     std::uintptr_t nativeWindow = 0;
     void* nativeDisplay = nullptr;
-    /// Presents that may wait to be shown, at least 1; the next one waits for the oldest. 1 is for ink: less
-    /// waits between the pen and the screen, and drawing and showing take turns.
+    /// The number of presents that may be in flight, at least 1. A further Present() waits for the oldest.
+    /// With 1 the delay from pen to screen is shortest, but drawing and showing do not overlap.
     int framesInFlight = 2;
-    /// Refreshes of the screen for each present, at least 0: 0 shows at once. The driver may clamp it.
+    /// The least number of screen refreshes between two presents. With 0 frames are shown at once. The driver
+    /// may clamp it.
     int swapInterval = 1;
-    /// A trace (moka/base/Trace.h) of the process, from the start of the thread until it has stopped. A file
-    /// that cannot be written is one warning. Empty: what the environment variable MOKA_TRACE names, if it is
-    /// set, from the first start in the process until the process ends.
+    /// The file for a trace (moka/base/Trace.h) of the process, from the start of the thread until Stop. If
+    /// the file cannot be written, a warning is logged. If it is empty, the environment variable MOKA_TRACE
+    /// names the file; that trace lasts from the first start in the process until the process ends.
     std::string tracePath{};
 };
 
-/// The context, and the way to it.
+/// The properties of the context.
 struct RenderContextInfo {
     std::string path; ///< for instance "EGL surfaceless platform, no surface"
-    /// As the driver says.
+    /// The strings of the driver.
     std::string vendor;
     std::string renderer;
     std::string version;
     std::string eglVersion;
-    int maxTextureSize = 0; ///< as lowered by the limits
+    int maxTextureSize = 0; ///< in texels, at most that of the limits
 };
 
 class MOKA_API RenderThread final : public TaskQueue {
 public:
-    /// Returns when the context is current on the new thread. error may be null; it is written on failure.
+    /// Starts a thread and opens its context. Returns when the context is current. On failure returns null
+    /// and sets *error, unless error is null.
     static std::unique_ptr<RenderThread> Start(RenderThreadOptions const& options, std::string* error);
     ~RenderThread() override;
 
-    /// Runs the accepted tasks, then refuses; returns when the thread has ended. Calling it again does
-    /// nothing.
+    /// Runs all accepted tasks, then refuses new ones and ends the thread. Returns when the thread has ended.
+    /// Further calls do nothing. Must not be called on the render thread.
     void Stop();
 
-    /// The context that Start reached.
+    /// The properties of the context.
     RenderContextInfo const& GetContextInfo() const;
 
-    /// Runs function on the render thread, in order with the posted tasks, and waits for it. False when the
-    /// queue refused it or it threw, which logs an error. On the render thread itself it runs at once.
+    /// Runs function on the render thread, in order with the posted tasks, and waits for it. On the render
+    /// thread it runs at once. Returns false if the queue refuses, or if function throws, which logs an
+    /// error.
     bool Call(std::function<void()> const& function);
 
-    /// Any thread: shows all draws posted before in the window. Posted itself; it waits while framesInFlight
-    /// presents are on their way, but never on the render thread. False when there
-    /// is no window, when it is gone, and after Stop(); the first time it logs an error.
+    /// Posts a task that shows all draws so far in the window. Waits first if framesInFlight presents are in
+    /// flight, except on the render thread. Returns false if there is no window, if it was destroyed, and
+    /// after Stop(). The first failure logs an error.
     bool Present();
 
 private:

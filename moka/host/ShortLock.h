@@ -1,5 +1,5 @@
-// ShortLock: holds a mutex that nobody keeps for longer than a few instructions. It tries a while before it
-// sleeps: with eight producers the sleeping and waking took two to three times as long as the posting.
+// ShortLock: locks a mutex that is only held for a few instructions. It spins for a while before it sleeps:
+// with eight producers, sleeping and waking took two to three times as long as posting.
 #pragma once
 
 #include <mutex>
@@ -11,7 +11,7 @@ public:
     explicit ShortLock(std::mutex& mutex) : mMutex(mutex) {
         for (int pauses = 1; pauses <= kLongest; pauses *= 2) {
             if (mMutex.try_lock()) return;
-            // Ever longer, since each try takes the cache line away from the holder.
+            // The pauses grow, because each try takes the cache line away from the holder.
             for (int i = 0; i < pauses; ++i) Pause();
         }
         mMutex.lock();
@@ -21,7 +21,7 @@ public:
     ShortLock& operator=(ShortLock const&) = delete;
 
 private:
-    // Together some microseconds: longer than a holder needs, unless it has lost its core.
+    // The pauses add up to some microseconds, longer than a holder needs unless it was preempted.
     static constexpr int kLongest = 64;
 
     static void Pause() {

@@ -18,12 +18,13 @@ TaskQueue::~TaskQueue() {
         std::lock_guard<std::mutex> const lock(mIn.mutex);
         mIn.ended = true;
     }
-    // What the tasks own may ask to wait when it dies, which nobody would end.
+    // Makes this thread the consumer, so that WaitForTasks returns at once if the destructor of a task calls
+    // it.
     mDone.consumer = std::this_thread::get_id();
     std::uint64_t done = mDone.count;
     for (ITask* task = TakeAll(); task; ++done) delete std::exchange(task, task->next);
     MarkDone(done);
-    // A waiter that was just let go still uses the members.
+    // Threads that have just been woken still use the members, so wait until they are gone.
     std::unique_lock<std::mutex> lock(mWaiters.mutex);
     mWaiters.changed.wait(lock, [this] { return mWaiters.count == 0; });
 }
@@ -42,7 +43,7 @@ bool TaskQueue::Post(ITask* task) {
         }
         mIn.last = task;
         ++mIn.posted;
-        // Whoever comes next need not notify again.
+        // Later posts need not notify again.
         wake = std::exchange(mIn.sleeping, false);
     }
     if (wake) mIn.work.notify_one();
@@ -101,8 +102,8 @@ ITask* TaskQueue::TakeAll() {
     return mIn.first.exchange(nullptr, std::memory_order_relaxed);
 }
 
-// Waits a little first. A consumer that is faster than the producers would sleep after every few tasks, and
-// each time a producer would pay for waking it, which takes longer than many posts.
+// Spins for a while before returning. A consumer that is faster than the producers would otherwise sleep
+// after every few tasks, and waking it costs a producer more than many posts.
 ITask* TaskQueue::TakeSoon() {
     for (int i = 0;; ++i) {
         if (mIn.first.load(std::memory_order_relaxed)) return TakeAll();
@@ -111,9 +112,9 @@ ITask* TaskQueue::TakeSoon() {
     }
 }
 
-// Null: stopped, drained, and refusing from now on.
+// Waits for tasks. Returns null if the queue was stopped and is empty; it then refuses all posts.
 ITask* TaskQueue::AwaitTasks() {
-    std::optional<TraceScope> trace; // ends without the lock
+    std::optional<TraceScope> trace; // declared first, so that it ends after the lock is released
     std::unique_lock<std::mutex> lock(mIn.mutex);
     while (!mIn.first && !mIn.stopping) {
         if (!trace) trace.emplace("wait", "no tasks");
@@ -137,7 +138,7 @@ void TaskQueue::RunTasks(ITask* first) {
             RunGuarded("mok_log", "TaskQueue: a task", [&task] { task->run(); });
         }
         if (trace) trace->End();
-        // Whoever waited may stop the trace, which is to have the tasks.
+        // A waiting thread may stop the trace as soon as it is woken, so add the tasks before.
         if (trace && (!first || done + 1 >= mDone.target)) trace->AddPending();
         MarkDone(++done);
     }
@@ -147,7 +148,7 @@ void TaskQueue::MarkDone(std::uint64_t count) {
     mDone.count = count;
     if (count < mDone.target) return;
     std::lock_guard<std::mutex> const lock(mWaiters.mutex);
-    mDone.target = kNoTarget; // those whose turn has not come ask again
+    mDone.target = kNoTarget; // waiters whose tasks are not done set it again
     mWaiters.changed.notify_all();
 }
 

@@ -1,10 +1,10 @@
-/// TaskQueue: the queue half of a render thread: any thread posts, one thread runs. An intrusive list under
-/// one short lock, taken over whole by the consumer and notified only when it sleeps; posting allocates
-/// nothing.
-/// Owner:   the creator; it must outlive every post. Tasks that were never run are freed with it, and
-///          threads that still wait for them return.
-/// Thread:  Post and WaitForTasks from any; Run once, on the one consumer thread. No lock is held while a
-///          task runs or is freed.
+/// TaskQueue: a queue that any thread posts to and one thread, the consumer, runs. It is an intrusive list
+/// under a short lock. The consumer takes the whole list at once, and is notified only if it sleeps. Posting
+/// allocates nothing.
+/// Owner:   the creator. The queue must outlive all posts. Its destructor deletes tasks that were never run,
+///          and threads that wait for them return.
+/// Thread:  Post and WaitForTasks on any thread; Run once, on the consumer thread. No lock is held while a
+///          task runs or is deleted.
 /// Order:   posting order.
 #pragma once
 
@@ -27,27 +27,28 @@ public:
     TaskQueue(TaskQueue const&) = delete;
     TaskQueue& operator=(TaskQueue const&) = delete;
 
-    /// Accepted until Run() has returned; also from inside a running task. Null is ignored: false.
+    /// Accepts tasks until Run() has returned, also from running tasks. A null task returns false.
     bool Post(ITask* task) override;
 
-    /// Returns when everything posted before the call has been run and freed; at once when nothing is left to
-    /// run. On the consumer thread itself it logs an error and returns at once.
+    /// Waits until everything posted before the call has been run and deleted. On the consumer thread it logs
+    /// an error and returns at once.
     void WaitForTasks() override;
 
 protected:
-    /// Runs tasks until RequestStop(), then the accepted tasks and those that they post, then refuses and
-    /// returns. onIdle is called each time the queue has run empty, before sleeping or returning; it may
-    /// post. An exception of a task is logged; the task is freed and the loop continues.
+    /// Runs tasks until RequestStop(). Then it runs the remaining tasks and those that they post, refuses
+    /// further posts and returns. It calls onIdle each time the queue becomes empty, before it sleeps or
+    /// returns; onIdle may post. An exception of a task is logged; the task is deleted and the loop
+    /// continues.
     void Run(std::function<void()> const& onIdle);
-    /// From any thread, also before Run() or from inside a task. Run() returns at the first moment when
-    /// nothing is queued, so whoever posts without a pause keeps it from returning.
+    /// Makes Run() return when the queue is empty. Any thread, also before Run() or in a task. A thread that
+    /// posts without a pause keeps Run() from returning.
     void RequestStop();
 
-    /// Whether this thread runs the tasks.
+    /// True on the thread that runs the tasks.
     bool IsConsumerThread() const;
 
 private:
-    static constexpr int kPatience = 8; // looks before sleeping, a yield apart: some microseconds
+    static constexpr int kPatience = 8; // tries before sleeping, with a yield between them: some microseconds
     static constexpr std::uint64_t kNoTarget = UINT64_MAX;
 
     ITask* TakeAll();
@@ -56,11 +57,11 @@ private:
     void RunTasks(ITask* first);
     void MarkDone(std::uint64_t count);
 
-    // The producers' part. The consumer comes here once for each list it takes.
+    // The producers' part. The consumer uses it once for each list that it takes.
     struct alignas(64) {
         std::mutex mutex;
         std::condition_variable work;
-        // These two are written under the lock and peeked at without.
+        // These two are written under the lock and also read without it.
         std::atomic<ITask*> first{nullptr};
         std::atomic<bool> stopping{false};
         ITask* last = nullptr;
@@ -69,9 +70,9 @@ private:
         bool ended = false;
     } mIn;
 
-    // The consumer's part, on a cache line that no producer touches: how many tasks are done, and at what
-    // count somebody wants to be told. Each is written before the other is read, sequentially consistent, so
-    // that of a consumer and a waiter that meet at least one sees the other.
+    // The consumer's part, on a cache line that producers do not use: the number of finished tasks, and the
+    // number at which a waiter wants to be notified. Consumer and waiter each write one of them before they
+    // read the other, with sequential consistency, so at least one of them sees the other's value.
     struct alignas(64) {
         std::atomic<std::uint64_t> count{0};
         std::atomic<std::uint64_t> target{kNoTarget};

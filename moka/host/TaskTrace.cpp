@@ -2,6 +2,7 @@
 
 #include "moka/graphics/task/ITask.h"
 
+#include <algorithm>
 #include <cstdlib>
 #include <cxxabi.h>
 #include <map>
@@ -29,7 +30,7 @@ std::string Describe(std::type_info const& type) {
     return text;
 }
 
-// Stays valid for good, as a trace needs it.
+// Returns a name that stays valid until the process ends, as a trace requires.
 char const* GetTypeName(std::type_info const& type) {
     static std::mutex lock;
     static auto& names = *new std::map<std::type_index, std::string>;
@@ -41,32 +42,49 @@ char const* GetTypeName(std::type_info const& type) {
 } // namespace
 
 void TaskTrace::Begin(ITask const& task) {
-    mType = &typeid(task);
-    Trace::TakeTaskName();
+    std::type_info const& type = typeid(task);
+    if (mCount > 0 && type != *mType) AddPending();
+    mType = &type;
 }
 
 void TaskTrace::End() {
-    char const* const name = Trace::TakeTaskName();
-    std::int64_t const now = Trace::GetTime();
-    bool const isShort = now - mLast < kShort;
-    bool const isSame = mCount > 0 && mPendingName == name && (name || *mPendingType == *mType);
-    if (!isShort || !isSame) AddPending();
+    Trace::TaskName const given = Trace::TakeTaskName();
+    if (mCount > 0 && given.name != mName) {
+        // A task names itself before it does anything, so the ones before ended then. One without a name takes the
+        // time since the last reading.
+        if (given.name) mLast = given.changed;
+        Add(mCount);
+    }
     if (mCount == 0) {
-        mPendingBegin = mLast;
-        mPendingType = mType;
-        mPendingName = name;
+        mBegin = mLast;
+        mName = given.name;
     }
     ++mCount;
+    if (++mUnread == kReading) ReadClock();
+}
+
+// What took long is an event of its own.
+void TaskTrace::ReadClock() {
+    std::int64_t const now = Trace::GetTime();
+    bool const isShort = now - mLast < kShort;
+    if (!isShort && mCount > mUnread) Add(mCount - mUnread);
+    mUnread = 0;
     mLast = now;
-    if (!isShort) AddPending();
+    if (!isShort) Add(mCount);
 }
 
 void TaskTrace::AddPending() {
-    if (mCount == 0) return;
-    TraceArgument const count{"count", static_cast<std::int64_t>(mCount), nullptr};
-    Trace::Add("task", mPendingName ? mPendingName : GetTypeName(*mPendingType), mPendingBegin, mLast, &count,
-               1);
-    mCount = 0;
+    if (mUnread > 0) ReadClock();
+    if (mCount > 0) Add(mCount);
+}
+
+// The first pending ones, until the last reading.
+void TaskTrace::Add(std::uint64_t count) {
+    TraceArgument const argument{"count", static_cast<std::int64_t>(count), nullptr};
+    Trace::Add("task", mName ? mName : GetTypeName(*mType), mBegin, mLast, &argument, 1);
+    mBegin = mLast;
+    mCount -= count;
+    mUnread = std::min(mUnread, mCount);
 }
 
 } // namespace Moka::detail

@@ -20,12 +20,13 @@ Function* Find(void* library, char const* name) {
     return library ? reinterpret_cast<Function*>(dlsym(library, name)) : nullptr;
 }
 
-// The functions of libxcb that are used here. Null members: there is no libxcb.
+// The functions of libxcb that are used here. They are null if libxcb is not installed.
 struct Xcb {
     Xcb() : library(dlopen("libxcb.so.1", RTLD_NOW | RTLD_LOCAL)) {}
 
     explicit operator bool() const {
-        return connect && disconnect && hasError && getGeometry && geometryReply && select && flush && poll;
+        return connect && disconnect && hasError && getAttributes && attributesReply && select && flush &&
+               poll;
     }
 
     void* const library;
@@ -33,9 +34,10 @@ struct Xcb {
     decltype(xcb_disconnect)* disconnect = Find<decltype(xcb_disconnect)>(library, "xcb_disconnect");
     decltype(xcb_connection_has_error)* hasError =
         Find<decltype(xcb_connection_has_error)>(library, "xcb_connection_has_error");
-    decltype(xcb_get_geometry)* getGeometry = Find<decltype(xcb_get_geometry)>(library, "xcb_get_geometry");
-    decltype(xcb_get_geometry_reply)* geometryReply =
-        Find<decltype(xcb_get_geometry_reply)>(library, "xcb_get_geometry_reply");
+    decltype(xcb_get_window_attributes)* getAttributes =
+        Find<decltype(xcb_get_window_attributes)>(library, "xcb_get_window_attributes");
+    decltype(xcb_get_window_attributes_reply)* attributesReply =
+        Find<decltype(xcb_get_window_attributes_reply)>(library, "xcb_get_window_attributes_reply");
     decltype(xcb_change_window_attributes)* select =
         Find<decltype(xcb_change_window_attributes)>(library, "xcb_change_window_attributes");
     decltype(xcb_flush)* flush = Find<decltype(xcb_flush)>(library, "xcb_flush");
@@ -47,24 +49,32 @@ Xcb const& GetXcb() {
     return xcb;
 }
 
-// An identifier of X has 29 bits; the windows of other systems are pointers, and a wl_display begins with a
-// pointer to its interface's description.
+// X identifiers have 29 bits; windows of other window systems are pointers.
+constexpr std::uintptr_t kXIdentifiers = std::uintptr_t{1} << 29;
+
+void* FindXlib() { return dlopen("libX11.so.6", RTLD_NOW | RTLD_NOLOAD); }
+
+// Returns true if EGL takes the number for a window of an X server: the server that DISPLAY names, or that of
+// an Xlib connection. A wl_display begins with a pointer to the description of its interface; an Xlib display
+// has the protocol version, which has been 11 since 1987.
 bool IsXWindow(void* display, std::uintptr_t window) {
-    if (window >= std::uintptr_t{1} << 29) return false;
+    if (!display) return window < kXIdentifiers || std::getenv("DISPLAY");
     void const* const wayland = dlsym(RTLD_DEFAULT, "wl_display_interface");
-    return !display || !wayland || *static_cast<void const* const*>(display) != wayland;
+    if (wayland && *static_cast<void const* const*>(display) == wayland) return false;
+    auto* const getVersion = Find<int(void*)>(FindXlib(), "XProtocolVersion");
+    return getVersion && getVersion(display) == 11;
 }
 
 struct Server {
-    std::string name; // empty: DISPLAY names it
+    std::string name; // if it is empty, DISPLAY names the server
     bool isKnown = true;
 };
 
-// The window may have been created a moment ago, on the application's connection: the server must have it before
-// another connection asks for it.
+// Flushes the application's connection, because the window may have been created a moment ago, and the server
+// must know it before another connection uses it.
 Server Synchronize(void* display) {
     if (!display) return {};
-    void* const xlib = dlopen("libX11.so.6", RTLD_NOW | RTLD_NOLOAD);
+    void* const xlib = FindXlib();
     auto* const getName = Find<char*(void*)>(xlib, "XDisplayString");
     auto* const sync = Find<int(void*, int)>(xlib, "XSync");
     if (!getName || !sync) return {{}, false};
@@ -79,15 +89,16 @@ struct XWindowWatch::Impl {
         : connection(connected), window(watched) {}
     ~Impl() { GetXcb().disconnect(connection); }
 
-    bool HasWindow() const {
+    // Not a pixmap, and not a window that only takes input: the driver shows nothing there, or fails later.
+    bool CanShow() const {
         Xcb const& xcb = GetXcb();
         xcb_generic_error_t* error = nullptr;
-        xcb_get_geometry_reply_t* const reply =
-            xcb.geometryReply(connection, xcb.getGeometry(connection, window), &error);
-        bool const exists = reply != nullptr;
+        xcb_get_window_attributes_reply_t* const reply =
+            xcb.attributesReply(connection, xcb.getAttributes(connection, window), &error);
+        bool const canShow = reply && reply->_class == XCB_WINDOW_CLASS_INPUT_OUTPUT;
         std::free(reply);
         std::free(error);
-        return exists;
+        return canShow;
     }
 
     void Select() const {
@@ -124,11 +135,13 @@ std::unique_ptr<XWindowWatch> XWindowWatch::Open(void* display, std::uintptr_t w
                  "\" cannot be reached; DISPLAY names it unless nativeDisplay is given";
         return nullptr;
     }
-    if (!impl->HasWindow()) {
+    if (window >= kXIdentifiers || !impl->CanShow()) {
         char number[24];
         std::snprintf(number, sizeof number, "0x%lx", static_cast<unsigned long>(window));
-        *error = std::string("the X server has no window ") + number +
-                 "; nativeWindow must exist before the render thread starts and until it has stopped";
+        *error =
+            std::string("the X server has no window ") + number +
+            " to show anything in; nativeWindow must exist before the render thread starts and until it has "
+            "stopped";
         return nullptr;
     }
     impl->Select();

@@ -1,7 +1,7 @@
-// XWindowWatch: a window of an X server, seen through a connection of its own: whether it exists, and whether it
-// has gone. EGL gets this connection where it takes one (EGL_EXT_platform_xcb): what X says about a window that
-// the application has destroyed then reaches nobody's error handler. The default one ends the process.
-// libxcb is looked up when it is needed; the EGL drivers for X use it themselves.
+// XWindowWatch: checks on its own connection to an X server whether a window exists. EGL uses this connection
+// if it can (EGL_EXT_platform_xcb). So X errors about a window that the application has destroyed do not
+// reach Xlib's error handler, which by default ends the process.
+// libxcb is loaded at run time; the EGL drivers for X use it as well.
 // Owner:  the render thread's context, which closes EGL's display first.
 // Thread: render thread.
 #pragma once
@@ -14,17 +14,18 @@ namespace Moka::detail {
 
 class XWindowWatch {
 public:
-    // display is an Xlib Display*, or null for the server that DISPLAY names. Null and an empty error: the
-    // window belongs to another window system, or libxcb is missing, so nothing is known. Null with an error:
-    // there is no such server or no such window.
+    // display is an Xlib Display*, or null for the server that DISPLAY names. Returns null and leaves *error
+    // empty if the window belongs to another window system or libxcb is missing. Returns null and sets *error
+    // if there is no such server or window.
     static std::unique_ptr<XWindowWatch> Open(void* display, std::uintptr_t window, std::string* error);
     ~XWindowWatch();
     XWindowWatch(XWindowWatch const&) = delete;
     XWindowWatch& operator=(XWindowWatch const&) = delete;
 
-    // An xcb_connection_t*.
+    // The connection, an xcb_connection_t*.
     void* GetConnection() const;
-    // Reads what the server has sent, without waiting. The window, or the server, has gone once it is true.
+    // Reads the server's messages without waiting. Returns true if the window was destroyed or the server has
+    // ended.
     bool IsGone();
 
 private:

@@ -1,5 +1,5 @@
-/// BlendStateDescriptor: how a fragment is combined with the pixel under it, as a value.
-/// A new one that is enabled replaces: the source counts once and the destination not at all.
+/// BlendStateDescriptor: the blend state and the colour mask, as a value.
+/// The default equations have the factors One and Zero: the source replaces the destination.
 #pragma once
 
 namespace Moka {
@@ -33,15 +33,15 @@ public:
         }
     };
 
-    /// Neither blends nor writes colour when enabled is false.
+    /// True: blends and writes colour. False: does neither.
     explicit BlendStateDescriptor(bool enabled) : mBlending(enabled), mColorWrite(enabled) {}
 
-    /// Whether to blend, and whether to write colours.
+    /// Switches blending and colour writes separately.
     void SetEnabled(bool blending, bool colorWrite) {
         mBlending = blending;
         mColorWrite = colorWrite;
     }
-    /// The equations of colour and alpha.
+    /// The blend equations of colour, and of alpha.
     void SetColorEquation(BlendingFunction function, BlendingFactor source, BlendingFactor destination) {
         mColor = {function, source, destination};
     }

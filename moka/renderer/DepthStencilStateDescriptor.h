@@ -1,6 +1,6 @@
 /// DepthStencilStateDescriptor: the depth and stencil tests of both faces, as a value.
-/// A new one with the stencil on always passes and keeps the stored value. The depth test, if on, passes nearer
-/// fragments and writes their depth.
+/// By default the stencil test, if on, always passes and keeps the stored value. The depth test, if on,
+/// passes nearer fragments and writes their depth.
 #pragma once
 
 namespace Moka {
@@ -8,7 +8,7 @@ namespace Moka {
 /// The numbers are the interface.
 enum StencilComparison { StencilEqual = 2, StencilNotEqual = 5, StencilAlways = 7 };
 
-/// What happens to the stored value.
+/// The change of the stored stencil value.
 enum StencilOperation {
     StencilKeep = 0,
     StencilZero = 1,
@@ -31,6 +31,8 @@ public:
         mReadMask = readMask;
         mWriteMask = writeMask;
     }
+    /// The change of the stored value where the stencil test fails, where the depth test fails, and where
+    /// both pass.
     void SetStencilOperation(StencilOperation stencilFail, StencilOperation depthFail,
                              StencilOperation pass) {
         mStencilFail = stencilFail;
@@ -49,7 +51,7 @@ public:
     StencilOperation GetDepthFail() const { return mDepthFail; }
     StencilOperation GetPass() const { return mPass; }
 
-    /// Without a stencil test, what the test would do does not matter.
+    /// Compares all values. If the stencil test is off in both, its other values are ignored.
     friend bool operator==(DepthStencilStateDescriptor const& a, DepthStencilStateDescriptor const& b) {
         if (a.mDepth != b.mDepth || a.mStencil != b.mStencil) return false;
         return !a.mStencil || a.HasStencilOf(b);

@@ -11,7 +11,9 @@ class IBlendStateObject {
 public:
     /// Takes effect with the next Apply().
     virtual void SetDescriptor(BlendStateDescriptor const& descriptor) = 0;
+    /// Sets the blend state of later draws.
     virtual void Apply() = 0;
+    /// Deletes the object.
     virtual void Release() = 0;
 
 protected:

@@ -1,6 +1,5 @@
 /// IDepthStencilBuffer: one combined depth and stencil buffer, to be attached to a render target of its size.
-/// Owner:  the creator, until Release(). Release it after detaching; released while attached, it is
-///         detached first.
+/// Owner:  the creator, until Release(). Releasing an attached buffer detaches it first.
 /// Thread: render thread.
 #pragma once
 

@@ -12,8 +12,8 @@ public:
     /// Takes effect with the next Apply().
     virtual void SetDescriptor(DepthStencilStateDescriptor const& descriptor) = 0;
 
-    /// While a stencil clip is set (RendererFactory::SetStencilClip), a state without a stencil test
-    /// leaves the clip's test as it is.
+    /// Sets the depth-stencil state of later draws. While a stencil clip is on
+    /// (RendererFactory::SetStencilClip), applying a state without a stencil test does nothing.
     virtual void Apply() = 0;
 
     /// Deletes the object.

@@ -1,4 +1,4 @@
-/// IGraphicsObject: vertices of one layout, and the drawing of them.
+/// IGraphicsObject: holds vertices of one layout and draws them.
 /// Owner:  the creator, until Release().
 /// Thread: render thread.
 /// Draw records target, scissor, blend and depth-stencil state, program and its parameters, textures and
@@ -14,21 +14,23 @@ enum class PrimitiveType { TriangleList, TriangleStrip };
 
 class IGraphicsObject {
 public:
-    /// Copies count vertices for stream 0, replacing all of the earlier ones, also with none. data may be
-    /// null when count is 0. Another stream, a negative count and null data are refused with a log line and
-    /// leave no vertices behind.
+    /// Replaces all vertices by copies of these. stream must be 0. With a count of 0, which needs no data,
+    /// the object has no vertices. Another stream, a negative count or null data logs an error, and the
+    /// object has no vertices.
     virtual void SetVertices(int stream, void const* data, int count) = 0;
 
-    /// Draws count vertices from the first one on, all that are left with -1. A range beyond the last vertex
-    /// is cut. Drawing nothing is legal. False when nothing can be drawn: no program that compiled is
-    /// current, the context is gone, or instances is not 1 (one log line).
+    /// Draws count vertices, starting with vertex first; -1 means all vertices from there. The range is cut
+    /// at the last vertex, and may be empty. Returns false if nothing can be drawn: the current program did
+    /// not compile or there is none, the context is detached, or memory runs out. instances must be 1;
+    /// another number logs an error and draws nothing.
     virtual bool Draw(int first, int count, int instances) = 0;
 
     /// Deletes the object.
     virtual void Release() = 0;
 
-    /// The box must enclose all pixels that draws of the present vertices cover. Such draws may join earlier
-    /// draws of their state, ahead of others that they do not touch. SetVertices forgets the box.
+    /// Optional. The box must enclose all pixels that draws of the current vertices cover. Such draws may be
+    /// merged with earlier draws of their state, ahead of draws that they do not overlap. SetVertices resets
+    /// the box.
     virtual void SetBounds(DrawBounds const&) {}
 
 protected:

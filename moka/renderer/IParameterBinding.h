@@ -1,6 +1,5 @@
-/// IParameterBinding: a handle on one uniform of a program: sets its value, knows its type.
-/// Owner:   the caller of GetParameter; deleting it is the release. It may outlive its program, and then does
-///          nothing.
+/// IParameterBinding: a handle for one uniform of a program. It sets the value and reports the type.
+/// Owner:   the caller of GetParameter, who deletes it. It may outlive its program; Set then does nothing.
 /// Thread:  render thread.
 /// Types:   the handle converts from the type it reports: a bool is one byte, an int or a texture unit an
 ///          int, a vector or a matrix its packed floats (matrices column-major).
@@ -11,7 +10,7 @@ namespace Moka {
 
 /// The numbers are the interface.
 enum BindingType {
-    BindingTypeUnknown = 0, ///< nothing of that name, or the compiler removed it: setting does nothing
+    BindingTypeUnknown = 0, ///< the program has no such uniform, or the compiler removed it: Set does nothing
     BindingTypeBool = 1,
     BindingTypeMatrix4 = 2,
     BindingTypeVector2 = 3,
@@ -23,9 +22,8 @@ enum BindingType {
 
 class IParameterBinding {
 public:
-    /// value points to one value of the type; it is copied. Uniforms belong to their program: a value that
-    /// is set while another program is current takes effect when this one is. A value equal to the last one
-    /// costs no call of the driver.
+    /// Copies one value of the uniform's type. The program need not be current: the value holds for its later
+    /// draws. Setting an equal value again makes no GL call.
     virtual void Set(void const* value) = 0;
     virtual ~IParameterBinding() = default;
 

@@ -1,9 +1,9 @@
 /// IRasterizerState: the scissor test: pixels outside the rectangle are neither drawn nor cleared.
-/// Owner:  the renderer; there is one.
+/// Owner:  the renderer, which has one such object.
 /// Thread: render thread.
-/// Units:  pixels of the target, origin at its first row and column: the bottom left of a host's frame buffer,
-///         the first texel of an off-screen target.
-/// Queries are answered from memory; GL is asked once when external GL may have changed the state.
+/// Units:  pixels of the target, origin at its first row and column: the bottom left of a host's frame
+///         buffer, the first texel of an off-screen target.
+/// Getters return cached values. They query GL only if external GL may have changed the state.
 #pragma once
 
 namespace Moka {
@@ -24,7 +24,7 @@ struct ScissorRect {
 
 class IRasterizerState {
 public:
-    /// The scissor test of later draws.
+    /// The scissor test of later draws and clears.
     virtual bool IsScissorEnabled() = 0;
     virtual void SetScissorEnabled(bool on) = 0;
     virtual ScissorRect GetScissorRect() = 0;

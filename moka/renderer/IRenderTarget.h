@@ -14,17 +14,17 @@ class IDepthStencilBuffer;
 
 class IRenderTarget {
 public:
-    /// Makes this the draw target and sets the viewport to all of it. Not a stack: activating the active
-    /// target does nothing. Leaves scissor, stencil, blend and masks alone.
+    /// Makes this the draw target and sets the viewport to its whole size. Does not change scissor, stencil,
+    /// blend and masks. Activations do not nest: activating the active target does nothing.
     virtual void Activate() = 0;
 
-    /// Ends drawing; external GL then finds the frame buffer that was bound before the first activation, and
-    /// its viewport (while deferred, only after RendererFactory::Flush). Does nothing for a target that is
-    /// not the active one. The flags let the driver drop the colour, and the depth and stencil contents.
+    /// Ends drawing, and binds the frame buffer and viewport that were set before the first activation (in
+    /// deferred mode only at RendererFactory::Flush). Does nothing if the target is not active. The flags let
+    /// the driver discard the colour, and the depth and stencil contents.
     virtual void Deactivate(bool discardColor, bool discardDepthStencil) = 0;
 
-    /// Reads a block. Pixels outside the target are skipped; the destination keeps its bytes there. Rows that
-    /// would overlap in the destination are refused with a log line.
+    /// Reads a block back. Pixels outside the target are not written. Logs an error and reads nothing if rows
+    /// would overlap in the destination.
     virtual void ReadPixels(int x, int y, int width, int height, PixelDestination const& destination) = 0;
 
     /// Deletes the object.
@@ -33,13 +33,15 @@ public:
     /// Clears within the scissor and ignores the colour mask; the draw target does not change.
     virtual void ClearColor(float r, float g, float b, float a) = 0;
 
-    /// Attaching another buffer replaces the attached one; a buffer attached elsewhere moves. Both leave the
-    /// draw target what it was. A buffer of another size, or any on a host's frame buffer, is refused with a
-    /// log line.
+    /// Attaches a depth-stencil buffer, in place of the attached one. A buffer that is attached to another
+    /// target is detached there. The draw target does not change. A buffer of another size, or any buffer for
+    /// a frame buffer of the host, logs an error and is not attached.
     virtual void AttachDepthStencil(IDepthStencilBuffer* buffer) = 0;
+    /// Detaches the buffer, if there is one. The draw target does not change.
     virtual void DetachDepthStencil() = 0;
 
-    /// Clears within the scissor and ignores the write masks; without a buffer it does nothing.
+    /// Clears depth, stencil, or both, within the scissor. Ignores the write masks. Without a buffer it does
+    /// nothing.
     virtual void ClearDepthStencil(bool clearDepth, float depth, bool clearStencil, int stencil) = 0;
 
 protected:

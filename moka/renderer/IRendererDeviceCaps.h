@@ -1,5 +1,5 @@
 /// IRendererDeviceCaps: the device's capabilities, read once when the context is attached.
-/// Thread: any, without GL. Before a context exists it answers with the minimum of OpenGL ES 3.0.
+/// Thread: any; makes no GL call.
 /// The vtable order is ABI: the destructor, then GetMaxTextureSize.
 #pragma once
 

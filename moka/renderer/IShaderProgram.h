@@ -1,7 +1,7 @@
-/// IShaderProgram: a vertex and a fragment stage, compiled and linked. One whose sources do not compile is an
-/// object like any other: it can be current, its parameters are of unknown type, and it draws nothing.
-/// Owner:  the creator, until Release(). It outlives its context: made current in a later one, it is
-///         compiled there, with the values and handles that it has.
+/// IShaderProgram: a vertex and a fragment stage, compiled and linked. A program whose sources do not compile
+/// can be used as well: it can be current, its parameters have an unknown type, and it draws nothing.
+/// Owner:  the creator, until Release(). It may outlive its context. If it is made current in a later
+///         context, it is compiled there and keeps its values and handles.
 /// Thread: render thread.
 /// The vtable order is ABI.
 #pragma once
@@ -18,8 +18,8 @@ public:
     /// Deletes the object.
     virtual void Release() = 0;
 
-    /// A new handle, which the caller owns. Never null: for a name that the linked program does not have, its
-    /// type is BindingTypeUnknown. Arrays are not handed out.
+    /// Returns a new handle, which the caller owns. Never null. Its type is BindingTypeUnknown if the linked
+    /// program has no uniform of that name, or if the uniform is an array.
     virtual IParameterBinding* GetParameter(char const* name) = 0;
 
 protected:

@@ -1,8 +1,6 @@
 /// ITextureObject: an RGBA8 texture, or one of several views of the same storage.
-/// Owner:  the creator; deleting it is the release. Storage that is shared lives until the last view
-///         goes.
-/// Thread: render thread. Deleting elsewhere is tolerated: the GL name is dropped when the render thread next
-///         runs.
+/// Owner:  the creator, who deletes it. Shared storage lives until its last view is deleted.
+/// Thread: render thread. Any thread may delete the object; the render thread then deletes the GL texture.
 /// Units:  texels; row 0 is the first row uploaded and is sampled at v = 0. Premultiplied alpha.
 #pragma once
 
@@ -18,7 +16,7 @@ public:
     virtual void SetLabel(char const* text) = 0;
     virtual char const* GetLabel() const = 0;
 
-    /// Makes the texture, with its own sampling state, current on a texture unit.
+    /// Binds the texture, with its own sampling state, to a texture unit.
     virtual void Bind(int unit) = 0;
 
     /// Replaces all texels; stride in bytes, 0 or less for tightly packed rows. Null pixels do nothing; a
@@ -29,23 +27,24 @@ public:
     /// pixels outside the texture are skipped; the others keep their places.
     virtual void Replace(Rect const& rect, void const* pixels, int stride) = 0;
 
-    /// Copies itself texel for texel into the current frame buffer's lower left corner, whatever blend,
-    /// scissor, stencil or mask are set to.
+    /// Copies its texels to the current frame buffer, at GL's origin. Ignores blend, scissor, stencil and
+    /// masks.
     virtual void DrawToCurrent() = 0;
 
-    /// A TextureParamWrapping or TextureParamFiltering id and its value, for this view alone; an unknown one
-    /// is refused with a log line.
+    /// Sets the value of a TextureParamWrapping or TextureParamFiltering id, for this view only. Unknown ids
+    /// and values log an error and change nothing.
     virtual void SetParameter(int id, int value) = 0;
 
-    /// Takes a copy of the bound render target: the smaller of both sizes, from its first row, without a
-    /// flip. A target without alpha reads as opaque; one over this texture's own storage changes nothing.
+    /// Copies the active render target into this texture, without a flip: the first rows and columns, up to
+    /// the smaller of both sizes. A target without alpha counts as opaque. If the target draws into this
+    /// texture, nothing happens.
     virtual void CopyFromRenderTarget() = 0;
 
     /// The size in texels.
     virtual int GetWidth() const = 0;
     virtual int GetHeight() const = 0;
 
-    /// Its value for this view; -1 for an unknown one.
+    /// The value of a parameter for this view; -1 for an unknown id.
     virtual int GetParameter(int id) const = 0;
 };
 

@@ -1,20 +1,19 @@
-/// PixelBuffer.h: source of an upload and destination of a read-back. RGBA8, four bytes
-/// a pixel, rows packed at rowLength pixels.
+/// PixelBuffer.h: the source of an upload and the destination of a read-back. RGBA8, four bytes a pixel. Rows
+/// are rowLength pixels apart.
 #pragma once
 
 namespace Moka {
 
-/// A texture's pixels inside a larger image: the block that starts at (x, y) of an image rowLength pixels
-/// wide.
+/// The pixels of a texture as a block of a larger image. The block starts at (x, y).
 struct PixelSource {
-    void const* pixels = nullptr; ///< null: no pixels, the texture starts transparent
-    /// The block's first pixel.
+    void const* pixels = nullptr; ///< the image's first pixel; null: the texture starts transparent
+    /// The block's first pixel, in pixels of the image.
     int x = 0;
     int y = 0;
     int rowLength = 0; ///< pixels
 };
 
-/// A block inside a larger image: skipRows rows down and skipPixels pixels in.
+/// A block inside a larger image, skipRows rows below the first row and skipPixels pixels from the left.
 struct PixelDestination {
     /// The image's first pixel.
     void* pixels = nullptr;

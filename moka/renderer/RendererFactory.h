@@ -1,4 +1,5 @@
-/// RendererFactory: creates all GPU objects. The implementation is chosen when linking; see README.md here.
+/// RendererFactory: creates all GPU objects. The implementation is chosen at link time; see README.md in this
+/// folder.
 /// Thread: render thread, except where a line says otherwise. Debug builds check it.
 /// Fails:  null or false, and logs an error with the driver's text; never an exception.
 #pragma once
@@ -24,7 +25,7 @@ class IRenderTarget;
 class IShaderProgram;
 class ITextureObject;
 
-/// Lowers the device's limits, so that tests see tall images cut with small ones.
+/// Lowers the device's limits, so that tests get bitmaps of several strips from small images.
 struct RendererLimits {
     int maxTextureSize = 0;  ///< texels; 0 keeps the device's own
     bool mergesDraws = true; ///< false: only draws of equal state and values become one draw call
@@ -37,89 +38,94 @@ struct RenderTargetSize {
     int height = 0;
 };
 
-/// How the context's owner looks up entry points by name (eglGetProcAddress has this type).
+/// A function that returns GL entry points by name. eglGetProcAddress has this type.
 using RendererProcLoader = void (*(*)(char const* name))();
 
 class MOKA_API RendererFactory {
 public:
-    /// Called by the owner of the context, on the render thread with the context current, once before
-    /// anything else and once after everything. Attach reads the device's capabilities and resets the
-    /// statistics; false (and an error in the log) when the context is not OpenGL ES 3.0 or another one is
-    /// attached. Without a loader there are no driver messages and no object labels. Detach deletes pooled
-    /// and orphaned GL names; objects that are still alive become inert and may be released later; a program
-    /// works again in the next context.
+    /// The owner of the context calls this before all other functions, on the thread that becomes the render
+    /// thread, with the context current. Reads the device's capabilities and resets the statistics. Logs an
+    /// error and returns false if the context is not OpenGL ES 3.0 or later, or if another one is attached.
+    /// Without a loader there are no driver messages and no object labels.
     static bool AttachContext(RendererLimits const& limits = {}, RendererProcLoader loader = nullptr);
+    /// The owner of the context calls this last, with the context current. Submits all requests and deletes
+    /// pooled GL objects. Objects that still exist become inert and may be released later. A program works
+    /// again in the next context.
     static void DetachContext();
 
-    /// Any thread. Never null.
+    /// The capabilities of the device. Any thread. Never null.
     static IRendererDeviceCaps const* GetRendererDeviceCaps();
-    /// Any thread: whether the driver's renderer string is exactly name.
+    /// True if the driver's GL_RENDERER string equals name exactly. Any thread.
     static bool IsGPUNameEqualTo(char const* name);
 
-    /// The texture starts with source's pixels (transparent without), explicit linear filters, clamp to edge,
-    /// and then the parameters in order. Null when the descriptor is empty or too large for the device.
+    /// Creates a texture with the pixels of source, or a transparent one if source has none. The sampling
+    /// state is linear and clamp to edge, then the parameters are set in order. Returns null if the size is
+    /// empty or too large for the device. If the descriptor has a model, the texture is another view of the
+    /// model's storage.
     static ITextureObject* CreateTextureObject(TextureDescriptor const& descriptor,
                                                TextureParameter const* parameters, int parameterCount,
                                                PixelSource const& source);
 
-    /// The texture outlives the target's use; its storage is kept alive by the target.
+    /// Creates a target that draws into the texture. The target keeps the texture's storage alive, not the
+    /// object.
     static IRenderTarget* CreateOffscreenRenderTarget(ITextureObject* texture);
 
-    /// The frame buffer the host gives as the default one, or the one bound right now; captured at this
-    /// moment.
+    /// Creates a target for the frame buffer that the host has bound now. Size in pixels.
     static IRenderTarget* CreateRenderTargetFromDefault(int width, int height);
+    /// Creates a target for the frame buffer of the active target, or else for the one that the host has
+    /// bound now.
     static IRenderTarget* CreateRenderTargetFromCurrent(int width, int height);
 
-    /// Of the active target: its viewport is all of it. 0 x 0 without one.
+    /// The size of the active target, which is also the viewport. 0 x 0 if no target is active.
     static RenderTargetSize GetActiveTargetSize();
 
-    /// A depth-stencil buffer of this size in pixels; null when the driver has no memory.
+    /// Creates a depth-stencil buffer of this size in pixels. Returns null if the driver is out of memory.
     static IDepthStencilBuffer* CreateDepthStencilBuffer(int width, int height);
 
-    /// GLSL ES 1.00 or 3.00. Attributes take locations 0, 1, ... in the order of their declaration. Never
-    /// null: if sources do not compile, an error is logged and the program draws nothing.
-    /// The name appears in messages and GL debuggers; all texts are copied.
+    /// Compiles and links GLSL ES 1.00 or 3.00. Attributes get locations 0, 1, ... in the order of their
+    /// declaration. Never null: if the sources do not compile, logs an error, and the program draws nothing.
+    /// The name appears in messages and GL debuggers. All texts are copied.
     static IShaderProgram* CreateShaderProgram(char const* vertexSource, char const* fragmentSource,
                                                char const* name);
 
-    /// Vertices of one stream, not indexed, drawn one instance at a time: streams is 1, indices and
-    /// instanceStreams are 0; anything else, and a descriptor without attributes, is refused.
+    /// Creates an object for vertices of this layout. streams must be 1, indices and instanceStreams 0, and
+    /// the descriptor must have attributes. Otherwise logs an error and returns null.
     static IGraphicsObject* CreateGraphicsObject(int streams, PrimitiveType primitive,
                                                  VertexDescriptor const* descriptor, int indices,
                                                  int instanceStreams);
 
-    /// A state object that starts with the descriptor.
+    /// Create a state object with this descriptor. It takes effect with Apply().
     static IBlendStateObject* CreateBlendStateObject(BlendStateDescriptor const& descriptor);
     static IDepthStencilState* CreateDepthStencilState(DepthStencilStateDescriptor const& descriptor);
 
-    /// Never null; not to be released.
+    /// The renderer's scissor state. Never null; do not release it.
     static IRasterizerState* GetRasterizerState();
 
-    /// While on, the current stencil test is a clip, which draws cannot switch off: applying a state without
-    /// a stencil test keeps it, and clearing the colour fills through it.
+    /// While on, the current stencil test is a clip: applying a state without a stencil test does not switch
+    /// it off, and clearing the colour affects only pixels that pass it.
     static void SetStencilClip(bool on);
 
-    /// Off until switched on. Immediate: all requests between an activation and its deactivation reach GL at
-    /// the deactivation, and the host gets its frame buffer back there. Deferred: they reach GL when somebody
-    /// could see the difference, at the latest in Flush(). A host that calls Flush() whenever its queue runs
-    /// empty switches it on.
+    /// Switches between immediate mode (the default) and deferred mode. In immediate mode, all requests
+    /// between an activation and its deactivation reach GL at the deactivation, which also binds the host's
+    /// frame buffer again. In deferred mode, requests reach GL when their result is needed, at the latest in
+    /// Flush(). Use it only if the host calls Flush() whenever its queue is empty.
     static void SetDeferred(bool on);
 
-    /// Before external GL: submits all requests so far. The host's frame buffers, viewport,
-    /// vertex array, culling, depth test and dither are as they were, pixel store holds GL's defaults, no
-    /// sampler is bound. The vertex and uniform buffers that the host had bound are bound again. Scissor,
-    /// blend, stencil and masks are as last set or applied here. Not restored: texture bindings, the program,
-    /// and uniform buffer binding point 23, which a host should not use. An active target stays the active
-    /// one.
+    /// Submits all requests so far. Call it before external GL.
+    /// It restores the host's frame buffers, viewport, vertex array, vertex and uniform buffer bindings,
+    /// culling, depth test and dithering. It sets the pixel store to GL's defaults and unbinds all samplers.
+    /// Scissor, blend, stencil and masks stay as last set or applied here. Texture bindings, the program, and
+    /// uniform buffer binding point 23, which a host should not use, are not restored. An active target stays
+    /// active.
     static void Flush();
-    /// Before external GL that draws into the active target: submits all requests so far. Then the
-    /// target is bound, and viewport, scissor, blend, stencil, masks, program and textures are as last set or
-    /// applied here. Until InvalidateState() every operation reaches GL at once.
+    /// Submits all requests so far, then binds the active target and sets viewport, scissor, blend, stencil,
+    /// masks, program and textures as last set or applied here. Call it before external GL that draws into
+    /// the active target. Until InvalidateState() every request reaches GL at once.
     static void Commit();
-    /// After external GL: drops the cached GL state.
+    /// Drops the cached GL state. Call it after external GL.
     static void InvalidateState();
 
-    /// Any thread: a snapshot.
+    /// A snapshot of the counts. Any thread.
     static RendererStatistics GetStatistics();
 };
 

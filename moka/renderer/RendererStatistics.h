@@ -1,6 +1,5 @@
-/// RendererStatistics: the renderer's live objects, and counts of its work since the context was attached.
-/// Objects are counted by kind. If any but the pooled ones are left when a test ends, the test has found a
-/// leak.
+/// RendererStatistics: the numbers of the renderer's live objects by kind, and counts of its work since the
+/// context was attached. Tests find leaks with them: at the end only pooled objects may be left.
 #pragma once
 
 #include <array>
@@ -17,14 +16,14 @@ enum class RunEnd {
     Clip, ///< or another depth-stencil state
     Target,
     Primitive, ///< or the layout of the vertices; a strip is always a run of its own
-    Values,    ///< integers that the run has as constants, or vertices that are too many to be moved together
-    Full,      ///< the list, or a block of values
+    Values,    ///< a constant of the run differs, or too many vertices would have to be copied
+    Full,      ///< the list is full
     Other,     ///< a clear, a copy or a flush lies between
 };
 /// The number of reasons.
 inline constexpr std::size_t kRunEnds = 10;
 
-/// One lower-case word.
+/// The reason as one lower-case word.
 constexpr char const* GetName(RunEnd end) {
     switch (end) {
     case RunEnd::Program:
@@ -52,22 +51,23 @@ constexpr char const* GetName(RunEnd end) {
 }
 
 struct RendererStatistics {
-    int textures = 0; ///< storages, not views
+    int textures = 0; ///< GL textures; several texture objects may share one
     /// Live objects by kind.
     int samplers = 0;
     int frameBuffers = 0;  ///< created by the renderer
-    int renderBuffers = 0; ///< in use; pooled ones are counted apart
+    int renderBuffers = 0; ///< in use, without the pooled ones
     int pooledRenderBuffers = 0;
-    int renderTargets = 0; ///< objects of our interfaces
+    int renderTargets = 0; ///< objects of the interfaces, as are the following
     int textureObjects = 0;
     int depthStencilBuffers = 0;
     int programs = 0;
-    int variants = 0; ///< of programs, which draw runs whose uniform values differ
+    int variants = 0; ///< rewritten programs, which draw runs whose uniform values differ
     int graphicsObjects = 0;
     int stateObjects = 0; ///< blend and depth-stencil states
-    int buffers = 0; ///< vertex buffers and vertex arrays of the context's own, kept until it is detached
+    int buffers = 0;      ///< the renderer's GL buffers and vertex arrays, kept while the context is attached
 
-    /// Draws that were requested, the runs that they were joined to, and the draw calls that the driver got.
+    /// The draws that were requested, the runs that they were joined into, and the draw calls that were
+    /// submitted.
     std::uint64_t drawRequests = 0;
     std::uint64_t runs = 0;
     std::uint64_t draws = 0;
@@ -84,7 +84,7 @@ struct RendererStatistics {
     std::uint64_t blendChanges = 0; ///< with the colour mask
     std::uint64_t depthStencilChanges = 0;
     std::uint64_t scissorChanges = 0;
-    std::uint64_t queries = 0; ///< questions to the driver, each of which may wait for it
+    std::uint64_t queries = 0; ///< queries of GL state, each of which may stall
 
     /// Work and bytes moved.
     std::uint64_t clears = 0;

@@ -1,6 +1,6 @@
 /// TextureDescriptor: size and format of a texture, as a value.
-/// Made from a model, it describes the same storage: the texture created from it shows the model's image, and
-/// the storage lives until the last texture over it is deleted. Sampling state is each texture's own.
+/// Constructed from a model, it describes another view of the model's storage. The storage lives until the
+/// last texture that uses it is deleted. Each texture has its own sampling state.
 #pragma once
 
 #include "moka/renderer/ITextureObject.h"
@@ -11,8 +11,8 @@ struct TextureDescriptor {
     int width = 0;  ///< texels
     int height = 0; ///< texels
 
-    /// The renderer's own codes. The only combination it knows is dimension 0 (2-D), format 2 (RGBA), internal
-    /// format 6 (RGBA8), type 1 (unsigned byte).
+    /// The renderer's own codes. It supports only dimension 0 (2-D), format 2 (RGBA), internal format 6
+    /// (RGBA8) and type 1 (unsigned byte).
     int dimension = 0;
     int format = 2;
     int internalFormat = 6;
@@ -22,9 +22,9 @@ struct TextureDescriptor {
     /// Not used.
     void const* reserved = nullptr;
 
-    ITextureObject const* model = nullptr; ///< not owned; null for storage of its own
+    ITextureObject const* model = nullptr; ///< not owned; null for new storage
 
-    /// Storage of its own.
+    /// Describes new storage.
     TextureDescriptor(int widthValue, int heightValue, int dimensionCode, int formatCode,
                       int internalFormatCode, int typeCode, bool flagValue, void const* reservedValue)
         : width(widthValue),
@@ -36,7 +36,8 @@ struct TextureDescriptor {
           flag(flagValue),
           reserved(reservedValue) {}
 
-    /// A null model makes an empty descriptor, which creates nothing.
+    /// Describes a view of the model's storage. A null model makes an empty descriptor, which creates no
+    /// texture.
     explicit TextureDescriptor(ITextureObject const* modelTexture)
         : width(modelTexture ? modelTexture->GetWidth() : 0),
           height(modelTexture ? modelTexture->GetHeight() : 0),

@@ -3,21 +3,22 @@
 
 namespace Moka {
 
-/// The names of the parameters, one number space for both kinds.
+/// The parameters for wrapping. Their numbers differ from those for filtering.
 enum TextureParamWrapping : int { TextureParamWrappingS = 0, TextureParamWrappingT = 1 };
-/// The filters: for shrinking and for growing.
+/// The parameters for the minification and the magnification filter.
 enum TextureParamFiltering : int { TextureParamFilteringMin = 4, TextureParamFilteringMag = 5 };
 
-/// Mipmapped: linear between texels and between the two levels nearest to the scale, so that a texture drawn
-/// smaller than half its size has no speckles; magnified it is linear. The levels are made when the texture is
-/// first drawn so, and again at the first such draw after its contents changed. They take a third more memory.
+/// Mipmapped: linear between texels and between the two nearest mipmap levels, so that a texture drawn at
+/// less than half its size does not alias. Magnification is linear. The levels are generated at the first
+/// draw that samples them, and again at the first such draw after the contents have changed. They take a
+/// third more memory.
 enum TextureParamFilteringValue : int {
     TextureFilterNearest = 0,
     TextureFilterLinear = 1,
     TextureFilterMipmapped = 2,
 };
 
-/// 2 names no mode: it is refused with a log line.
+/// How coordinates outside 0 to 1 are wrapped. The value 2 is unknown and logs an error.
 enum TextureParamWrappingValue : int {
     TextureWrapRepeat = 0,
     TextureWrapClampToEdge = 1,

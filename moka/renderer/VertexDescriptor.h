@@ -27,8 +27,8 @@ public:
         }
     };
 
-    /// offset is -1, right behind the attribute before, and stream is 0: vertices have one stream. False, and
-    /// nothing is added, for anything else.
+    /// Adds an attribute. offset must be -1 (directly after the attribute before), and stream 0 (the only
+    /// one). Returns false and adds nothing for other values, or beyond kMaxAttributes.
     bool addAttribute(VertexAttributeType type, int components, int offset, int stream) {
         bool const isKnown = components >= 1 && components <= 4 && offset == -1 && stream == 0;
         if (!isKnown || mCount == kMaxAttributes) return false;
@@ -40,7 +40,7 @@ public:
     int GetAttributeCount() const { return mCount; }
     Attribute const& GetAttribute(int index) const { return mAttributes[static_cast<std::size_t>(index)]; }
 
-    /// Floats of one vertex.
+    /// The number of floats of one vertex.
     int GetFloatCount() const {
         int count = 0;
         for (int i = 0; i < mCount; ++i) count += GetAttribute(i).components;

@@ -6,7 +6,7 @@ from pathlib import Path
 
 
 class ListError(Exception):
-    """Something in the list cannot be used; the message names the place and says what to do."""
+    """An error in the list; the message names the place and what to do."""
 
 
 @dataclass
@@ -23,7 +23,7 @@ class Fault:
 
     @property
     def key(self):
-        """Names the fault by what it does, so that a result outlives a new name."""
+        """Identifies the fault by its change, so that results stay valid if it is renamed."""
         return hashlib.sha256("\0".join((self.file, self.preset, self.old, self.new)).encode()).hexdigest()[:16]
 
 
@@ -76,7 +76,7 @@ def read_list(folder):
 
 
 def _find(text, wanted):
-    """Begin and end of every place where wanted stands, whatever the spaces and line breaks in both."""
+    """Begin and end of every occurrence of wanted, ignoring differences in spaces and line breaks."""
     places = [i for i, c in enumerate(text) if not c.isspace()]
     packed = "".join(text[i] for i in places)
     wanted = "".join(wanted.split())
@@ -98,7 +98,7 @@ def plant(text, fault):
 
 
 def check(root, faults):
-    """What is wrong with the faults' texts, a line each."""
+    """The errors in the faults' texts, a line each."""
     problems = []
     for fault in faults:
         try:

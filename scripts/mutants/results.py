@@ -1,10 +1,10 @@
-"""Results, kept by fault and tree in .cache/mutants/results.jsonl, and what they add up to."""
+"""Results by fault and tree, in .cache/mutants/results.jsonl, and their sums."""
 
 import json
 from collections import Counter, defaultdict
 from pathlib import Path
 
-# ABSENT: this machine leaves the source out of the build.
+# ABSENT: this machine does not build the source.
 CAUGHT, MISSED, BROKEN, ABSENT = "caught", "missed", "broken", "absent"
 PIXEL = ("moka_pixel_", "angle:", "moka_app_tests", "readme.")  # these need a driver
 

@@ -1,4 +1,4 @@
-"""A copy of the tree with builds of its own, in which faults are planted; and the test programs that run there."""
+"""A copy of the tree with its own builds, in which faults are planted; and the test programs that run there."""
 
 import fcntl
 import hashlib
@@ -14,7 +14,7 @@ from pathlib import Path
 
 from mutants.faults import plant
 
-# What decides which fault is seen.
+# The folders that affect which faults are seen.
 WATCHED = ("CMakeLists.txt", "CMakePresets.json", "apps", "cmake", "java", "moka", "scenes", "tests")
 # Entries of CTest that are no GoogleTest program of their name, by the beginning of theirs: the folder that has them
 # (CTest looks through the others for nothing), and what they need built.
@@ -31,7 +31,7 @@ PATIENCE = 3  # times as long as without a fault, then a program hangs
 
 
 class WorkspaceError(Exception):
-    """The copy itself does not build or does not pass."""
+    """The copy without a fault does not build or does not pass its tests."""
 
 
 def _git_files(root):
@@ -41,7 +41,7 @@ def _git_files(root):
 
 
 def tree_hash(root):
-    """Of everything that decides which fault is seen, as it stands in the working tree."""
+    """A hash of all files in the working tree that affect which faults are seen."""
     digest = hashlib.sha256()
     for name in _git_files(root):
         if name.split("/")[0] in WATCHED and not name.startswith("tests/mutants/"):
@@ -112,13 +112,13 @@ class Workspace:
         return done.stdout.decode(errors="replace")
 
     def is_compiled(self, fault):
-        """False for a source that this machine leaves out of the build, for want of a JDK for instance."""
+        """False for a source that this machine does not build, for instance without a JDK."""
         return not fault.file.endswith(".cpp") or fault.file in self._compiled
 
     # --- building
 
     def has(self, program):
-        """False for what this machine cannot run: without a JDK, or on ANGLE where that was not fetched."""
+        """False for programs that this machine cannot run: without a JDK, or without ANGLE."""
         if program.startswith(ANGLE) and not (self.root / "third_party/angle").is_dir():
             return False
         return self._targets.issuperset(self.targets_of(program))
@@ -132,12 +132,12 @@ class Workspace:
         return entry[1] if entry else (program.removeprefix(ANGLE),)
 
     def build(self, preset, programs):
-        """None, or the compiler's complaint."""
+        """None, or the compiler's error."""
         targets = sorted({target for program in programs for target in self.targets_of(program)})
         if not targets:
             return None
         command = ["cmake", "--build", "--preset", preset, "-j", str(os.cpu_count()), "--target", *targets]
-        # What the compiler's cache calls the same, wherever it lies.
+        # Paths that the compiler's cache treats as equal.
         environment = {"CCACHE_BASEDIR": str(self.root), "CCACHE_NOHASHDIR": "1", **os.environ}
         done = subprocess.run(command, cwd=self.tree, env=environment, stdout=subprocess.PIPE,
                               stderr=subprocess.STDOUT)
@@ -153,7 +153,7 @@ class Workspace:
         path.write_text(plant(original, fault))
 
     def restore(self):
-        """Takes the planted fault out again. What was built with it is built anew by the next build."""
+        """Removes the planted fault. The next build compiles the file again."""
         if self.planted:
             path, original, _ = self.planted
             path.write_text(original)
@@ -196,7 +196,7 @@ class Workspace:
                                                                    process.returncode)
 
     def limit_of(self, preset, program):
-        """How long a program may take, by how long it takes without a fault. It is built, and no fault planted."""
+        """The time limit of a program, from its time without a fault. It must be built, and no fault planted."""
         kept = self.folder / f"baseline-{preset}.json"
         if preset not in self.baselines:
             known = json.loads(kept.read_text()) if kept.is_file() else {}
@@ -229,7 +229,7 @@ def _limit_memory():
 
 
 def _kill_all(process):
-    """With what it has started."""
+    """Kills a process and its children."""
     try:
         os.killpg(process.pid, signal.SIGKILL)
     except ProcessLookupError:

@@ -70,4 +70,10 @@ void ExampleWindow::Close() {
     XSync(ToX(mDisplay), False);
 }
 
+// A cut buffer, as nobody owns the selection.
+void ExampleWindow::SetClipboard(std::string const& text) {
+    XStoreBytes(ToX(mDisplay), text.data(), static_cast<int>(text.size()));
+    XSync(ToX(mDisplay), False);
+}
+
 } // namespace Moka::Testing

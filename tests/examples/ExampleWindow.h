@@ -5,6 +5,7 @@
 #include "tests/support/TestImages.h"
 
 #include <cstdint>
+#include <string>
 
 namespace Moka::Testing {
 
@@ -22,6 +23,8 @@ public:
     void Resize(int width, int height);
     // As a click on its frame's button does it.
     void Close();
+    // Text that other programs paste.
+    void SetClipboard(std::string const& text);
 
 private:
     void* const mDisplay;

@@ -13,6 +13,7 @@
 #include <filesystem>
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
+#include <regex>
 #include <thread>
 
 namespace Moka::Testing {
@@ -27,6 +28,8 @@ constexpr int kEdge = 24;
 constexpr int kPage = 1200;
 constexpr int kView = kHeight - kToolbar;
 constexpr int kWheelStep = 80;
+constexpr int kControl = 64; // as SDL numbers them
+constexpr int kShift = 1;
 constexpr int kImageSlack = 1; // a scaled image is sampled from a tile's corner or from the page's
 
 // For some seconds: the sanitizers and a busy machine take their time.
@@ -66,8 +69,17 @@ public:
         }
         Add("release " + at(to) + " 1");
     }
-    void Key(char key) { Add("key " + std::to_string(static_cast<int>(key)) + " 0"); }
-    void Undo() { Add("key 122 64"); } // Ctrl and z
+    void Key(char key, int modifiers = 0) {
+        Add("key " + std::to_string(static_cast<int>(key)) + ' ' + std::to_string(modifiers));
+    }
+    // Answers the prompt of a key with the end of what it proposes replaced.
+    void Ask(char key, int modifiers, std::size_t count, std::string const& end) {
+        Key(key, modifiers);
+        for (std::size_t i = 0; i < count; ++i) Key('\b');
+        if (!end.empty()) Add("text " + end);
+        Key('\r');
+        Add("idle");
+    }
     std::string const& GetText() const { return mText; }
 
 private:
@@ -164,7 +176,7 @@ TEST_F(NotebookWindowTest, ShowsWhatItsFileDrawsAndOpensItAgain) {
     script.Key('r');
     script.Drag({325, 150}, {325, 320});
     script.Drag({400, 150}, {400, 320}); // is taken back
-    script.Undo();
+    script.Key('z', kControl);
     script.Add("move 600 420 0");
     script.Add("drop photo.png"); // 480 x 320, selected
     script.Add("idle");
@@ -206,7 +218,6 @@ TEST_F(NotebookWindowTest, ShowsWhatItsFileDrawsAndOpensItAgain) {
     EXPECT_FALSE(GetPagePart(Grab()) == GetPagePart(scrolled)) << "zoomed in";
     Do("key 0 key Home");
     ExpectSame(GetPagePart(top), GetPagePart(Grab()), "zoomed back");
-    EXPECT_TRUE(SaveImage(top, "notebook-window.png"));
     Close(*process);
 
     process = Start({}); // the last page
@@ -254,6 +265,55 @@ TEST_F(NotebookWindowTest, ABrokenPageAndAFullDiskAreToldAndKeepTheirFile) {
     EXPECT_EQ(result.status, 1);
     EXPECT_THAT(result.err, HasSubstr("cannot save"));
     EXPECT_THAT(result.err, HasSubstr("full.json: File too large"));
+}
+
+// By its keys and prompts: what it exports, pastes, saves elsewhere and opens, and what it says of what cannot be.
+TEST_F(NotebookWindowTest, ExportsPastesAndOpensWhatItIsTold) {
+    std::string const dot = "{\"DrawStroke\":{\"paint\":{\"color\":\"#FF000000\"},\"points\":[[300,";
+    auto const write = [&](char const* page, int row, char const* more) {
+        WriteFile(mFolder.Path(page),
+                  "{\"size\": [1200, 1600], \"background\": \"#FFFFFF\", \"operations\": [" + dot +
+                      std::to_string(row) + ",9]]}}" + more + "]}");
+    };
+    write("page.json", 200, "");
+    write("high.json", 16'500, ",{\"DrawBitmap\":{\"bitmap\":\"broken.png\",\"dst\":[0,0,90,90]}}");
+    write("higher.json", 65'800, "");
+    WriteFile(mFolder.Path("broken.png"), "no picture");
+    mWindow.SetClipboard(mFolder.Path("photo.png"));
+    Script script;
+    script.Ask('e', kControl, 8, "view.png");
+    script.Ask('e', kControl | kShift, 8, "whole.png");
+    script.Key('v', kControl);
+    script.Add("drop broken.png");
+    script.Ask('s', kControl | kShift, 8, "second.json");
+    script.Ask('o', kControl, 0, "high.json");
+    script.Ask('e', kControl | kShift, 8, "high.webp");
+    script.Ask('o', kControl, 0, "higher.json");
+    script.Ask('e', kControl | kShift, 10, "higher.png");
+    script.Drag({400, 400}, {500, 400});
+    script.Key('s', kControl);
+    script.Add("quit"); // while it saves
+    ProcessResult const result = Start({"page.json", "--replay", WriteScript(script)})->Wait();
+    EXPECT_EQ(result.status, 0);
+    for (char const* const told :
+         {"cannot put ", "broken.png on the page", "cannot read the image", "no side above 16383",
+          "the page has 66206 rows and an image at most 65535"})
+        EXPECT_THAT(result.err, HasSubstr(told));
+    EXPECT_EQ(LoadImage(mFolder.Path("view.png")).GetColor(300 + kEdge, 200), (Color{0, 0, 0, 255}));
+    ExpectSame(Draw("page.json"), LoadImage(mFolder.Path("whole.png")), "exported");
+    EXPECT_THAT(ReadFile(mFolder.Path("page-second.json")), HasSubstr("photo.png"));
+    EXPECT_THAT(ReadFile(mFolder.Path("higher.json")), HasSubstr("]}}\n]}\n")) << "saved whole";
+}
+
+TEST_F(NotebookWindowTest, TheRenderThreadAllocatesNothingForInkOnceItIsWarm) {
+    Script script;
+    for (float y = 200; y < 700; y += 100) WriteWord(script, 200, y);
+    script.Add("quit");
+    ProcessResult const result =
+        Start({"page.json", "--statistics", "--replay", WriteScript(script)})->Wait();
+    std::smatch count;
+    ASSERT_TRUE(std::regex_search(result.out, count, std::regex("(\\d+) in the last")));
+    EXPECT_LT(std::stoi(count[1]), 100) << "20 strokes made more than some vectors grow";
 }
 
 TEST_F(NotebookWindowTest, SaysWhatToDoWithoutAWindow) {

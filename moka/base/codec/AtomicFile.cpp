@@ -16,7 +16,7 @@ namespace {
 constexpr std::size_t kBufferBytes = 65536;
 constexpr int kMaxLinks = 40;
 constexpr int kMaxNameAttempts = 100;
-// Of the target's name in the temporary one, whose length the file system limits too.
+// The part of the target's name in the temporary name, because file systems limit the length of names.
 constexpr std::size_t kMaxNameBytes = 100;
 
 std::string FolderOf(std::string const& path) {
@@ -32,8 +32,8 @@ std::string RandomLetters() {
     return letters;
 }
 
-// A rename is only safe from a power failure when the folder is on the disk too. Not every file system can do
-// it, and the file itself is whole either way, so a refusal is no failure.
+// A rename survives a power failure only if the folder is flushed as well. Not every file system supports
+// this. A failure is ignored, because the file itself is complete in any case.
 void FlushFolder(std::string const& folder) {
     int const file = open(folder.empty() ? "." : folder.c_str(), O_RDONLY | O_DIRECTORY | O_CLOEXEC);
     if (file < 0) return;
@@ -59,7 +59,7 @@ bool AtomicFile::Open(std::string const& path) {
     return true;
 }
 
-// Done by hand because a link may lead to a file that is yet to be made, which realpath refuses.
+// Resolves links without realpath, which fails if a link points to a file that does not exist yet.
 bool AtomicFile::FollowLinks(std::string const& path) {
     mTarget = path;
     for (int i = 0; i < kMaxLinks; ++i) {
@@ -75,7 +75,7 @@ bool AtomicFile::FollowLinks(std::string const& path) {
 bool AtomicFile::CheckTarget(bool& replaces, unsigned& mode) {
     struct stat status = {};
     if (stat(mTarget.c_str(), &status) != 0) {
-        // Any other trouble shows, with its own reason, when the temporary file is made.
+        // ENOENT is no failure here: creating the temporary file reports a missing folder.
         return errno == ENOENT || Fail("cannot write there", errno);
     }
     if (S_ISDIR(status.st_mode)) return Fail("it is a folder", 0);
@@ -92,11 +92,11 @@ bool AtomicFile::CreateTemporary() {
     for (int i = 0; i < kMaxNameAttempts; ++i) {
         std::string candidate = folder;
         candidate.append(".").append(name).append(".").append(RandomLetters()).append(".tmp");
-        // Made by open rather than mkstemp, so that the process's file mask and the folder's access lists
+        // Uses open instead of mkstemp, so that the process's umask and the folder's access control lists
         // apply.
         mFile = open(candidate.c_str(), O_WRONLY | O_CREAT | O_EXCL | O_CLOEXEC, 0666);
         if (mFile >= 0) {
-            mTemporary = std::move(candidate); // throws nothing, so that the file is never forgotten
+            mTemporary = std::move(candidate); // does not throw, so that the file is always removed
             return true;
         }
         if (errno != EEXIST && errno != EINTR) break;
@@ -126,12 +126,13 @@ bool AtomicFile::WriteStart(void const* data, std::size_t count) noexcept {
 bool AtomicFile::Commit() {
     if (mFailedStep || !Flush()) return false;
     if (fsync(mFile) != 0) return Fail("cannot flush it to the disk", errno);
-    // Some file systems report a full disk only here. After EINTR the descriptor is gone all the same.
+    // Some file systems report a full disk only at close. After EINTR the descriptor is closed as well.
     int const closed = close(mFile);
     int const error = errno;
     mFile = -1;
     if (closed != 0 && error != EINTR) return Fail("cannot finish it", error);
-    std::string const folder = FolderOf(mTarget); // nothing may fail once the file is renamed
+    std::string const folder =
+        FolderOf(mTarget); // allocated before, because nothing may fail after the rename
     if (rename(mTemporary.c_str(), mTarget.c_str()) != 0) return Fail("cannot rename to it", errno);
     mTemporary.clear();
     FlushFolder(folder);

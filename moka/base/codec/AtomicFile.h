@@ -1,10 +1,9 @@
-// AtomicFile: writes a file so that its name shows either the old content or the whole new one. Everything
-// goes to a temporary file in the same folder (".name.xxxxxx.tmp"), which takes the name over only after it
-// has reached the disk. A new file gets the usual permissions, a replaced one keeps its own.
-// Links:  a symbolic link stays one; the file it leads to is replaced, or made.
-// Fails:  on anything but a regular file or nothing under the name, and on a write-protected file. The first
-//         failure is remembered; from then on nothing is written, and the temporary file goes with this
-//         object.
+// AtomicFile: replaces a file atomically: its name always refers to the old content or to the complete new
+// content. The data is written to a temporary file in the same folder (".name.xxxxxx.tmp"), flushed to the
+// disk, and renamed. A new file gets the default permissions; a replaced file keeps its own.
+// Links:  a symbolic link is kept; its target is replaced or created.
+// Fails:  if the name exists and is not a regular file, or is write-protected. The first failure is stored;
+//         after it nothing is written, and the destructor removes the temporary file.
 #pragma once
 
 #include "moka/base/NonAssignable.h"
@@ -23,15 +22,15 @@ public:
 
     bool Open(std::string const& path);
 
-    // Allocate nothing and throw nothing, so that codecs written in C can call them.
+    // These allocate nothing and do not throw, so that codecs in C can call them.
     bool Write(void const* data, std::size_t count) noexcept;
-    // Overwrites from the first byte on; count bytes must have been written before.
+    // Overwrites the first count bytes, which must have been written before.
     bool WriteStart(void const* data, std::size_t count) noexcept;
     std::uint64_t GetBytesWritten() const { return mWritten; }
 
     bool Commit();
 
-    // Empty while nothing has failed.
+    // The reason of the first failure; empty if there is none.
     std::string GetReason() const;
 
 private:
@@ -43,13 +42,13 @@ private:
     bool Fail(char const* step, int error) noexcept;
 
     std::string mTarget;
-    std::string mTemporary; // empty while there is none
+    std::string mTemporary; // empty if there is no temporary file
     std::unique_ptr<unsigned char[]> mBuffer;
     std::size_t mBuffered = 0;
     std::uint64_t mWritten = 0;
     int mFile = -1;
     char const* mFailedStep = nullptr;
-    int mError = 0; // 0: the step says all
+    int mError = 0; // an errno, or 0
 };
 
 } // namespace Moka::detail

@@ -45,7 +45,7 @@ void LogFailure(char const* action, std::string const& path, std::string const& 
                         Printable(path).c_str(), reason.c_str());
 }
 
-// The log line, then the reason for the caller.
+// Logs the failure and passes the reason to the caller.
 void Fail(char const* action, std::string const& path, std::string& reason, std::string* told) {
     LogFailure(action, path, reason);
     if (told) told->swap(reason);
@@ -60,13 +60,13 @@ void TellNoMemory(std::string* told) noexcept {
     }
 }
 
-// What was read all the same.
+// Logs a warning for an image that was read although its colour profile could not be used.
 void LogIgnoredProfile(std::string const& path, std::string const& reason) {
     __android_log_print(ANDROID_LOG_WARN, "mok_log", "image '%s': its colour profile is ignored: %s",
                         Printable(path).c_str(), reason.c_str());
 }
 
-// Strings and codecs throw when memory runs out, which is a failure like any other here.
+// Calls function and treats bad_alloc, which strings and codecs throw, like any other failure.
 template <class Function>
 auto Attempt(char const* action, std::string* told, Function const& function) -> decltype(function()) {
     try {
@@ -94,7 +94,7 @@ ImageCodec const* FindCodec(ImageSource& source, std::string& reason) {
     for (ImageCodec const* codec : kCodecs) {
         if (codec->matches(head)) return codec;
     }
-    reason = head.size == 0 ? "the file is empty" : "it is no PNG, JPEG, WebP or mki file";
+    reason = head.size == 0 ? "the file is empty" : "it is not a PNG, JPEG, WebP or mki file";
     return nullptr;
 }
 
@@ -151,7 +151,7 @@ std::string ExtensionOf(std::string const& path) {
     std::size_t const dot = name.rfind('.');
     if (dot == std::string::npos) return {};
     std::string extension = name.substr(dot + 1);
-    // Not tolower, which listens to the process's language.
+    // Does not use tolower, which depends on the process's locale.
     for (char& c : extension) {
         if (c >= 'A' && c <= 'Z') c = static_cast<char>(c - 'A' + 'a');
     }
@@ -194,7 +194,7 @@ bool Save(Bitmap const* bitmap, std::string const& path, int quality, std::strin
     Describe(trace, codec->format, view.size);
     detail::AtomicFile file;
     bool const isSaved = file.Open(path) && codec->encode(view, quality, file, reason) && file.Commit();
-    // When the file failed, what the codec has to say about it is only a consequence.
+    // If writing the file failed, the codec's message is only a consequence.
     if (!isSaved && !file.GetReason().empty()) reason = file.GetReason();
     return isSaved;
 }
@@ -209,7 +209,7 @@ Bitmap* BitmapFactory::CreateBitmap(String const* path, int width, int height, s
     return Attempt("read", reason, [&]() -> Bitmap* {
         std::string wrong;
         if (detail::CheckSize(width, height, wrong)) return DecodeFile(path, {width, height}, reason);
-        wrong.insert(0, "the size asked for, ");
+        wrong.insert(0, "the requested size, ");
         Fail("read", path ? path->ToUtf8() : std::string(), wrong, reason);
         return nullptr;
     });

@@ -7,7 +7,7 @@
 namespace Moka::detail {
 namespace {
 
-// The largest in use are tables for presses, of about 3 MiB.
+// The largest profiles in use, for printing presses, have about 3 MiB.
 constexpr std::size_t kMaxProfileBytes = std::size_t{16} << 20;
 
 // Steps between the levels of each channel at which a profile is compared with sRGB.
@@ -38,9 +38,11 @@ Profile OpenProfile(cmsContext context, ByteSpan bytes) {
     return Profile(cmsOpenProfileFromMemTHR(context, bytes.data, static_cast<cmsUInt32Number>(bytes.size)));
 }
 
-// Others (links of devices, abstract and named colours) do not say what a file's numbers look like.
+// True for profiles that define the colours of a file's pixels. Device links, abstract and named colour
+// profiles do not.
 bool IsOfDevice(cmsHPROFILE profile) {
-    // As a number, like the colour space below: a file may hold values that the enumerations do not have.
+    // Converted to a number, as the colour space below, because a file may contain values that are not in the
+    // enumerations.
     switch (static_cast<cmsUInt32Number>(cmsGetDeviceClass(profile))) {
     case cmsSigInputClass:
     case cmsSigDisplayClass:
@@ -52,7 +54,7 @@ bool IsOfDevice(cmsHPROFILE profile) {
     }
 }
 
-// 0 where the profile is not for such pixels.
+// Returns 0 if the profile is not for pixels of this kind.
 cmsUInt32Number ChooseFormat(cmsUInt32Number space, PixelKind kind) {
     constexpr cmsUInt32Number kGreyAndThree =
         COLORSPACE_SH(PT_GRAY) | EXTRA_SH(3) | CHANNELS_SH(1) | BYTES_SH(1);
@@ -98,7 +100,7 @@ bool ColorTransform::Open(ByteSpan bytes, PixelKind kind, std::string& reason) {
     if (!OpenContext(reason)) return false;
     Profile const profile = OpenProfile(ToContext(mContext.get()), bytes);
     if (!profile) return Refuse(reason, "it is damaged");
-    if (!IsOfDevice(profile.get())) return Refuse(reason, "it is of no device");
+    if (!IsOfDevice(profile.get())) return Refuse(reason, "it is not a device profile");
     return Create(profile.get(), kind, reason);
 }
 
@@ -149,7 +151,7 @@ bool ColorTransform::IsIdentity(PixelKind kind) const {
     return true;
 }
 
-// In place, so a fourth byte that is not colour is left where it is.
+// Converts in place, so a fourth byte that is not a colour is not changed.
 void ColorTransform::Apply(unsigned char* pixels, std::size_t count) const {
     cmsDoTransform(mTransform.get(), pixels, pixels, static_cast<cmsUInt32Number>(count));
     if (!mIsCmyk) return;

@@ -1,9 +1,9 @@
-// ColorTransform: converts decoded pixels to sRGB, with Little CMS, as the colour profile of their file says.
-// Without a profile, and with one whose colours are sRGB's to within one level, it changes no byte.
-// Units:  four bytes a pixel, alpha straight. 8 bits a channel, perceptual intent.
-// Thread: one at a time; two objects may work side by side.
-// Fails:  a profile that is damaged, of another colour space than the pixels, or no profile of a device: false
-//         and the reason; pixels then stay as they are.
+// ColorTransform: converts decoded pixels to sRGB by the colour profile of their file, with Little CMS.
+// Without a profile, or with one that differs from sRGB by at most one level, it does not change the pixels.
+// Units:  four bytes a pixel, straight alpha, 8 bits a channel, perceptual intent.
+// Thread: one at a time; different objects may be used on different threads.
+// Fails:  if a profile is damaged, has another colour space than the pixels, or is not a device profile, Open
+//         returns false and the reason. Apply then does nothing.
 #pragma once
 
 #include "moka/base/codec/ImageSource.h"
@@ -14,13 +14,13 @@
 namespace Moka::detail {
 
 enum class PixelKind {
-    Grey,      // red, green and blue are equal; takes a grey profile as well as one of RGB
+    Grey,      // red, green and blue are equal; the profile may be a grey or an RGB profile
     Rgb,       //
     CmykInk,   // 255 is full ink
     CmykLight, // 255 is no ink
 };
 
-// CIE x and y.
+// CIE x and y coordinates.
 struct Chromaticities {
     double white[2];
     double red[2];
@@ -33,15 +33,15 @@ public:
     ColorTransform();
     ~ColorTransform();
 
-    // From an ICC profile.
+    // Uses an ICC profile.
     bool Open(ByteSpan profile, PixelKind kind, std::string& reason);
-    // From primaries, and from the exponent that encodes light: 0.45455 for most displays, 0 for sRGB's curve.
+    // Uses primaries and the encoding exponent: 0.45455 for most displays, 0 for the curve of sRGB.
     bool Open(Chromaticities const& primaries, double gamma, std::string& reason);
 
-    // Whether Apply does anything. Always so for CMYK once a profile was opened.
+    // True if Apply changes pixels. Always true for CMYK after a profile was opened.
     explicit operator bool() const { return mTransform != nullptr; }
 
-    // In place. The fourth byte stays, that of CMYK becomes 255.
+    // Converts in place. The fourth byte is not changed, except that of CMYK, which becomes 255.
     void Apply(unsigned char* pixels, std::size_t count) const;
 
 private:
@@ -56,13 +56,13 @@ private:
     bool Create(void* profile, PixelKind kind, std::string& reason);
     bool IsIdentity(PixelKind kind) const;
 
-    std::string mError; // Little CMS's last
+    std::string mError; // the last message of Little CMS
     std::unique_ptr<void, ContextDeleter> mContext;
     std::unique_ptr<void, TransformDeleter> mTransform;
     bool mIsCmyk = false;
 };
 
-// The name that an ICC profile has for people; "unnamed" or "damaged" where there is none.
+// Returns the description of an ICC profile; "unnamed" or "damaged" if there is none.
 std::string GetProfileName(ByteSpan profile);
 
 } // namespace Moka::detail

@@ -9,7 +9,7 @@ constexpr unsigned kOrientationTag = 0x0112;
 constexpr unsigned kShortType = 3;
 constexpr std::size_t kEntryBytes = 12;
 
-// A TIFF structure, whose own header says how its numbers are stored. Outside it everything reads as 0.
+// Reads a TIFF structure, whose header defines the byte order. Reading beyond its end returns 0.
 class Tiff {
 public:
     explicit Tiff(ByteSpan bytes) : mBytes(bytes) {

@@ -1,7 +1,7 @@
-// ImageCodec.h: the shape all codecs share. A codec is a constant table of functions without state.
-// Fails:  false and the reason, a phrase without the file's name; whatever was allocated is freed. A reason
-//         left empty by encode means the file itself failed and knows why.
-// Order:  every codec checks the size a file claims with CheckSize before it allocates by it.
+// ImageCodec.h: the common interface of the codecs. A codec is a constant table of stateless functions.
+// Fails:  functions return false and the reason, a phrase without the file's name, and free all memory. If
+//         encode leaves the reason empty, writing the file failed, and AtomicFile has the reason.
+// Order:  every codec checks the size in the file's header with CheckSize before it allocates.
 #pragma once
 
 #include "moka/base/BitmapFactory.h"
@@ -14,7 +14,7 @@
 
 namespace Moka::detail {
 
-// A decoded image: RGBA8, premultiplied, rows without gaps.
+// A decoded image: RGBA8, premultiplied, rows packed.
 struct PixelBuffer {
     std::unique_ptr<unsigned char[]> pixels;
     PixelSize size;
@@ -41,15 +41,15 @@ struct PixelView {
 struct ImageCodec {
     ImageFormat format;
 
-    // Whether a file that begins like this is the codec's to read. head has kSignatureBytes, fewer only when
-    // the file has.
+    // True if the codec reads files that begin like this. head has kSignatureBytes, or fewer if the file is
+    // shorter.
     bool (*matches)(ByteSpan head);
 
-    // Fills in all but format and fileBytes, from what stands before the pixels where that is enough.
+    // Sets all members except format and fileBytes. Reads only the data before the pixels, if that is enough.
     bool (*readInfo)(ImageSource& source, ImageInfo& info, std::string& reason);
 
-    // target is the size the image shall have; {0, 0} is its own. target is within the limits. Where it
-    // succeeds, a reason is why the file's colour profile was ignored.
+    // Decodes the image, scaled to target, or in its own size if target is {0, 0}. target is within the
+    // limits. If it succeeds and sets a reason, that is why the file's colour profile was ignored.
     bool (*decode)(ImageSource& source, PixelSize target, PixelBuffer& image, std::string& reason);
 
     // view is within the limits; quality is 0 ... 100.
@@ -63,14 +63,15 @@ extern ImageCodec const kJpegCodec;
 extern ImageCodec const kWebpCodec;
 extern ImageCodec const kMkiCodec;
 
-// Every side 1 ... kMaxSide and the pixels within kMaxBytes.
+// Returns true if both sides are in 1 ... kMaxSide and the pixels take at most kMaxBytes. Otherwise sets
+// reason.
 bool CheckSize(std::int64_t width, std::int64_t height, std::string& reason);
 
-// What is decoded when target is asked for and the file has own.
+// Returns target, or own if target is {0, 0}.
 inline PixelSize ChooseSize(PixelSize target, PixelSize own) { return target == PixelSize{} ? own : target; }
 
-// For codecs that deliver a whole image: brings it to the size, in its own memory when the result fills most
-// of that, so that two large copies never stand side by side.
+// Scales a whole image, for codecs that cannot decode row by row. If the result fills most of the image's
+// memory, it scales in place, so that there are never two large copies.
 bool ScaleImage(PixelBuffer& image, PixelSize size, std::string& reason);
 
 } // namespace Moka::detail

@@ -16,7 +16,7 @@ namespace {
 
 constexpr std::size_t kBlockBytes = 65536;
 
-// Encoding hardly ever enlarges; the slack is for what travels beside the pixels.
+// Encoded images are rarely larger than decoded ones. The 64 MiB are for metadata.
 constexpr std::uint64_t kMaxFileBytes = BitmapFactory::kMaxBytes + (std::uint64_t{64} << 20);
 
 } // namespace
@@ -26,7 +26,7 @@ ImageSource::~ImageSource() {
 }
 
 bool ImageSource::OpenFile(char const* path, std::string& reason) {
-    // Without O_NONBLOCK opening a pipe would wait for a writer before it can be refused.
+    // Without O_NONBLOCK, opening a pipe would wait for a writer before the pipe can be refused.
     mFile = open(path, O_RDONLY | O_CLOEXEC | O_NONBLOCK);
     struct stat status = {};
     if (mFile < 0 || fstat(mFile, &status) != 0) {

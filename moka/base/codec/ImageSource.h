@@ -1,9 +1,10 @@
-// ImageSource: the bytes of one encoded image, from a file or from memory, read once from front to back or as
-// a whole, as the codec likes it. Files are read, never mapped: a file cut short under us then is a short
-// read and not a signal.
-// Owner:   of the open file and of what was read from it; memory belongs to the caller and must outlive this.
-// Fails:   anything but a regular file, a file that cannot be opened, or one no image of ours can fill.
-// Cost:    reading on keeps one block in memory; Prefix keeps what was asked for.
+// ImageSource: the bytes of one encoded image, from a file or from memory. A codec reads it sequentially or
+// as a whole. Files are read, not mapped: if a file is truncated meanwhile, the result is a short read, not a
+// signal.
+// Owner:   owns the open file and the bytes read from it. Memory passed to OpenMemory must outlive this
+//          object.
+// Fails:   if the file cannot be opened, is not a regular file, or is larger than any valid image.
+// Cost:    sequential reading keeps one block in memory; Prefix keeps all requested bytes.
 #pragma once
 
 #include "moka/base/NonAssignable.h"
@@ -34,20 +35,20 @@ public:
     bool OpenFile(char const* path, std::string& reason);
     void OpenMemory(void const* data, std::size_t size);
 
-    // Of the whole, as it was when opened.
+    // The total size when it was opened.
     std::uint64_t GetSize() const { return mSize; }
 
-    // The first bytes, count or fewer when there are no more. False when reading fails or memory runs out.
-    // Independent of reading on; valid until the next Prefix.
+    // Sets span to the first count bytes, or to fewer if there are no more. Returns false if reading fails or
+    // memory runs out. Does not affect sequential reading. The span is valid until the next call of Prefix.
     bool Prefix(std::uint64_t count, ByteSpan& span, std::string& reason);
 
-    // Reads on. The next stretch, of a length that suits the source; empty at the end and after an error.
-    // Valid until the next call of either.
+    // Sequential reading: returns the next block, of a suitable length; empty at the end and after an error.
+    // The block is valid until the next call of NextBlock or Read.
     ByteSpan NextBlock();
-    // Copies; fewer than count only at the end and after an error.
+    // Sequential reading: copies count bytes, or fewer at the end and after an error. Returns their number.
     std::size_t Read(void* to, std::size_t count);
 
-    // Why reading on stopped before a codec had what it needed.
+    // Why sequential reading ended early: a read error, or a truncated file.
     std::string GetEndReason() const;
 
 private:

@@ -1,9 +1,10 @@
-// JpegCodec.cpp: JPEG through TurboJPEG. Grey, RGB, YCbCr, CMYK and YCCK files become sRGB, opaque, by their
-// ICC profile where they have one; an EXIF orientation is not applied, the rows come as the file has them.
-// Saving flattens on white.
-// Damage: a warning of the library means that it guessed pixels, and is a failure, but for the few that real
-//         cameras cause and that leave the pixels right (kHarmless). The library keeps the first warning of
-//         an image only, so the commonest damage, a missing end, is looked for here.
+// JpegCodec.cpp: JPEG with TurboJPEG. Grey, RGB, YCbCr, CMYK and YCCK files become opaque sRGB, by their ICC
+// profile if they have one. The EXIF orientation is not applied. Saving flattens on white.
+// Damage: a warning of the library means that it guessed pixels, which counts as a failure. Exceptions are a
+// few warnings
+//         that files of real cameras cause and that do not affect pixels (kHarmless). The library keeps only
+//         the first warning of an image, so this file itself checks for the most frequent damage, a missing
+//         end.
 #include "moka/base/codec/ColorTransform.h"
 #include "moka/base/codec/Exif.h"
 #include "moka/base/codec/ImageCodec.h"
@@ -17,12 +18,12 @@
 namespace Moka::detail {
 namespace {
 
-// From this quality on colour is kept at full resolution: who asks for it wants thin coloured lines clean.
+// From this quality on chroma has full resolution, so that thin coloured lines stay sharp.
 constexpr int kFullColourQuality = 90;
-// The header is nearly always within this; profiles and previews can push it further.
+// The header is nearly always within this prefix. Profiles and previews can move it beyond.
 constexpr std::uint64_t kFirstPrefix = 65536;
 
-// Beginnings or inner parts of the library's own texts; it has no codes for them.
+// Parts of the library's warning texts; it has no codes for warnings.
 constexpr char const* kHarmless[] = {"extraneous bytes before marker", "unknown JFIF revision number",
                                      "Unknown Adobe color transform code",
                                      "Inconsistent progression sequence"};
@@ -58,20 +59,20 @@ bool Matches(ByteSpan head) {
     return head.size >= 3 && head.data[0] == 0xFF && head.data[1] == 0xD8 && head.data[2] == 0xFF;
 }
 
-// What the markers of a file tell that the library does not.
+// Information from a file's markers that the library does not report.
 struct Markers {
     bool hasEnd = false;
     bool hasAdobe = false;
     ByteSpan exif;
-    // An ICC profile is cut into up to 255 parts, which may come in any order; each says its number, from 1,
-    // and how many there are.
+    // An ICC profile consists of up to 255 parts in any order. Each contains its number, from 1, and the
+    // number of parts.
     std::vector<ByteSpan> profileParts;
     bool isProfileWhole = true;
 };
 
 template <std::size_t size>
 bool BeginsWith(ByteSpan bytes, char const (&text)[size]) {
-    return bytes.size >= size && std::memcmp(bytes.data, text, size) == 0; // with its zero byte
+    return bytes.size >= size && std::memcmp(bytes.data, text, size) == 0; // including the zero byte
 }
 
 void AddProfilePart(ByteSpan part, Markers& markers) {
@@ -95,8 +96,9 @@ void ReadSegment(unsigned code, ByteSpan content, Markers& markers) {
         AddProfilePart({content.data + sizeof(kProfile), content.size - sizeof(kProfile)}, markers);
 }
 
-// Segments are skipped by their length, so an end marker in an embedded preview is not taken for the image's.
-// In between, and in coded data, a marker is FF and neither stuffing (00, FF) nor a restart (D0 ... D7).
+// Skips segments by their length, so that the end marker of an embedded preview does not count. Between
+// segments and in coded data, a marker is FF followed by a byte other than stuffing (00, FF) and restart (D0
+// ... D7).
 Markers FindMarkers(ByteSpan file) {
     Markers markers;
     for (std::size_t i = 2; i + 1 < file.size;) {
@@ -129,17 +131,17 @@ struct Header {
     bool IsCmyk() const { return colourSpace == TJCS_CMYK || colourSpace == TJCS_YCCK; }
 };
 
-// An odd subsampling makes the library call the header bad, but it decodes it; so what counts is whether the
-// size was found.
+// The library reports an error for unusual subsamplings but decodes them. So the header counts as valid if it
+// has a size.
 bool ReadHeader(Handle const& handle, ByteSpan file, Header& header, std::string& reason) {
     if (!handle) return Refuse(reason, "not enough memory to decode it");
     int const result = tjDecompressHeader3(handle.Get(), file.data, file.size, &header.width, &header.height,
                                            &header.subsampling, &header.colourSpace);
     if (header.width >= 1 && header.height >= 1) return true;
-    return Refuse(reason, result == 0 ? "it holds tables but no image" : handle.GetText());
+    return Refuse(reason, result == 0 ? "it contains tables but no image" : handle.GetText());
 }
 
-// The parts in a row; empty where there are none, or where some are missing.
+// Returns the joined parts of the profile; empty if there are none or some are missing.
 std::vector<unsigned char> JoinProfile(Markers const& markers) {
     std::vector<unsigned char> profile;
     bool const isWhole =
@@ -164,7 +166,7 @@ bool ReadInfo(ImageSource& source, ImageInfo& info, std::string& reason) {
     for (std::uint64_t count = kFirstPrefix;; count *= 8) {
         ByteSpan head;
         if (!source.Prefix(count, head, reason)) return false;
-        // The library has then seen all markers before the pixels.
+        // After a successful read the prefix contains all markers before the pixels.
         if (ReadHeader(handle, head, header, reason)) {
             DescribeMarkers(head, info);
             break;
@@ -177,7 +179,8 @@ bool ReadInfo(ImageSource& source, ImageInfo& info, std::string& reason) {
     return CheckSize(header.width, header.height, reason);
 }
 
-// The smallest the decoder itself can make that is not smaller than wanted on an axis that shrinks.
+// Returns the smallest size that the decoder can produce and that is at least wanted on each axis that
+// shrinks.
 PixelSize ChooseDecodedSize(PixelSize own, PixelSize wanted) {
     int count = 0;
     tjscalingfactor const* const factors = tjGetScalingFactors(&count);
@@ -192,7 +195,7 @@ PixelSize ChooseDecodedSize(PixelSize own, PixelSize wanted) {
     return best;
 }
 
-// Files with Adobe's marker hold CMYK inverted, which makes them products of light; without it, of ink.
+// Converts CMYK without a profile. Files with Adobe's marker contain inverted values (255 is no ink).
 void ConvertCmyk(PixelBuffer const& image, bool isInverted) {
     unsigned const flip = isInverted ? 0 : 255;
     unsigned char* pixel = image.pixels.get();
@@ -204,7 +207,7 @@ void ConvertCmyk(PixelBuffer const& image, bool isInverted) {
     }
 }
 
-// Leaves a reason where the file's profile is ignored.
+// Sets reason if the file's profile is ignored.
 void ConvertColors(Header const& header, Markers const& markers, PixelBuffer const& image,
                    std::string& reason) {
     bool const isCmyk = header.IsCmyk();
@@ -267,7 +270,7 @@ bool Encode(PixelView const& view, int quality, AtomicFile& file, std::string& r
     std::size_t const stride = view.GetWidth() * 3;
     std::unique_ptr<unsigned char[]> const flat(
         new (std::nothrow) unsigned char[stride * static_cast<std::size_t>(view.size.height)]);
-    if (!flat) return Refuse(reason, "not enough memory to lay it over white");
+    if (!flat) return Refuse(reason, "not enough memory to flatten it on white");
     for (int y = 0; y < view.size.height; ++y) {
         FlattenOnWhite(view.Row(y), flat.get() + stride * static_cast<std::size_t>(y), view.GetWidth());
     }

@@ -1,5 +1,5 @@
-// MkiCodec.cpp: this platform's own container: 32 bytes of header, then the pixels as they are in memory,
-// plain or as one Zstandard frame. Written for loading fast; docs/mki-format.md has every byte.
+// MkiCodec.cpp: the "mki" format: a header of 32 bytes, then the pixels as they are in memory, uncompressed
+// or as one Zstandard frame. It is designed for fast loading. docs/mki-format.md describes it.
 #include "moka/base/codec/ImageCodec.h"
 
 #include <cstring>
@@ -15,11 +15,11 @@ constexpr unsigned char kMagic[4] = {'M', 'K', 'I', '1'};
 constexpr std::uint64_t kFormatRgba8 = 1;
 constexpr std::uint64_t kStored = 0;
 constexpr std::uint64_t kZstandard = 1;
-// The longest header of a Zstandard frame, and in it the flag that a content checksum follows.
+// The longest header of a Zstandard frame, and the position and value of its content checksum flag.
 constexpr std::size_t kFrameHeaderBytes = 18;
 constexpr std::size_t kFrameDescriptor = 4;
 constexpr unsigned kFrameChecksumFlag = 1u << 2;
-// Of Zstandard's levels the one that keeps up with the disk; higher ones cost much time for little.
+// The Zstandard level that is as fast as the disk. Higher levels take much more time and save little.
 constexpr int kLevel = 1;
 
 struct Header {
@@ -96,7 +96,7 @@ bool ReadInfo(ImageSource& source, ImageInfo& info, std::string& reason) {
     return true;
 }
 
-// Delivers the payload's pixels in pieces of any size.
+// Reads the payload's pixels in pieces of any size.
 class PayloadReader {
 public:
     explicit PayloadReader(ImageSource& source) : mSource(source) {}
@@ -123,7 +123,7 @@ public:
         return true;
     }
 
-    // The content's checksum stands behind the last pixel.
+    // Checks the content checksum, which follows the last pixel.
     bool Finish(std::string& reason) {
         if (!mContext) return true;
         unsigned char nothing = 0;
@@ -207,7 +207,7 @@ struct CompressorDeleter {
 };
 using Compressor = std::unique_ptr<ZSTD_CCtx, CompressorDeleter>;
 
-// Compresses a stretch of pixels into the file, to the frame's end when it is the last.
+// Compresses pixels to the file. If they are the last ones, also ends the frame.
 bool Compress(ZSTD_CCtx* context, ByteSpan pixels, bool isLast, AtomicFile& file, std::string& reason) {
     unsigned char block[16 * 1024];
     ZSTD_inBuffer in{pixels.data, pixels.size, 0};
@@ -233,7 +233,7 @@ bool Encode(PixelView const& view, int, AtomicFile& file, std::string& reason) {
     ZSTD_CCtx_setParameter(context.get(), ZSTD_c_checksumFlag, 1);
     ZSTD_CCtx_setPledgedSrcSize(context.get(), header.GetPixelBytes());
 
-    // The header holds the payload's length, so its place is kept and filled in last.
+    // The header contains the payload's length, so it is written last.
     unsigned char bytes[kHeaderBytes] = {};
     if (!file.Write(bytes, kHeaderBytes)) return false;
     for (int y = 0; y < view.size.height; ++y) {

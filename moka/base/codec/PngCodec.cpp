@@ -1,7 +1,8 @@
-// PngCodec.cpp: PNG through libpng, row by row. Every colour type, depth and interlacing becomes RGBA8;
-// 16-bit channels are rounded.
-// Colours: an ICC profile counts first, then the mark "sRGB", then primaries with gamma, then gamma alone, which
-//          libpng itself corrects. Gamma 0.45455 is sRGB's, near enough to change nothing.
+// PngCodec.cpp: PNG with libpng, row by row. Every colour type, depth and interlacing becomes RGBA8; 16-bit
+// channels are rounded.
+// Colours: in order of priority, an ICC profile, the sRGB chunk, primaries with gamma, and gamma alone, which
+// libpng
+//          corrects. Gamma 0.45455 is close enough to sRGB to change nothing.
 #include "moka/base/codec/ColorTransform.h"
 #include "moka/base/codec/Exif.h"
 #include "moka/base/codec/ImageCodec.h"
@@ -17,22 +18,22 @@
 namespace Moka::detail {
 namespace {
 
-// Measured (bench/codec) against libpng's defaults, level 6 and a filter chosen for each row: an ink page is
-// written in a third of the time with a fifth more bytes, a photo in a fifth of the time with 3 % more. At
-// this level choosing filters costs more time than it saves bytes, for either.
+// Measured (bench/codec) against libpng's defaults, level 6 and a filter chosen for each row: an ink page
+// takes a third of the time and a fifth more bytes, a photo a fifth of the time and 3 % more bytes. At this
+// level, choosing a filter for each row is not worth its time, for either.
 constexpr int kCompressionLevel = 3;
 constexpr int kFilter = PNG_FILTER_SUB;
-// What decides colours, and only that, is read besides pixels.
+// The only chunks that are read besides pixels: those that define colours.
 constexpr png_byte kColorChunks[] = "gAMA\0cHRM\0sRGB\0iCCP";
 constexpr int kColorChunkCount = 4;
-// For what a person asks of a file.
+// Chunks that are read for GetImageInfo only.
 constexpr png_byte kExifChunk[] = "eXIf";
 constexpr png_byte kAnimationChunk[] = "acTL";
 // One IDAT chunk, and one write, per this many bytes.
 constexpr std::size_t kChunkBytes = 65536;
 
-// libpng reports an error by a jump that runs no destructors. So everything that owns memory lives in the
-// callers of the functions that call setjmp, and those have only plain locals.
+// libpng reports errors by longjmp, which runs no destructors. So functions that call setjmp have only plain
+// local variables; their callers own all memory.
 struct ErrorText {
     char text[160] = "";
     char profile[160] = ""; // why libpng refuses the colour profile
@@ -44,7 +45,7 @@ void OnError(png_structp png, png_const_charp message) {
     png_longjmp(png, 1);
 }
 
-// What libpng can go on from is no news to a caller who gets the pixels, but for a profile that it refuses.
+// Ignores libpng's warnings, because it continues after them, except that it has refused a colour profile.
 void OnWarning(png_structp png, png_const_charp message) {
     constexpr char kProfile[] = "iCCP: ";
     constexpr std::size_t kLength = sizeof(kProfile) - 1;
@@ -68,7 +69,7 @@ struct Reader {
     bool isAtEnd = false;
     int passes = 1;
     ColorTransform colors;
-    png_fixed_point gamma = 0; // that libpng shall correct, times 100,000; 0 is none
+    png_fixed_point gamma = 0; // for libpng to correct, times 100,000; 0 is none
 
     PixelSize GetSize() const {
         return {static_cast<int>(png_get_image_width(png, info)),
@@ -99,8 +100,8 @@ bool OpenReader(Reader& reader, ImageSource& source, Purpose purpose) {
     reader.info = png_create_info_struct(reader.png);
     if (!reader.info) return false;
     png_set_read_fn(reader.png, &reader, OnRead);
-    // A negative count skips, unread and not inflated, every chunk that changes no pixel. So none of them
-    // costs memory, and the limit on their length only has to let through what real files carry.
+    // A negative count skips all other ancillary chunks without reading or inflating them, so they take no
+    // memory. The limit on the length of chunks must only be large enough for real files.
     png_set_keep_unknown_chunks(reader.png, PNG_HANDLE_CHUNK_NEVER, nullptr, -1);
     png_set_keep_unknown_chunks(reader.png, PNG_HANDLE_CHUNK_AS_DEFAULT, kColorChunks, kColorChunkCount);
     if (purpose == Purpose::Info) {
@@ -108,8 +109,7 @@ bool OpenReader(Reader& reader, ImageSource& source, Purpose purpose) {
         png_set_keep_unknown_chunks(reader.png, PNG_HANDLE_CHUNK_ALWAYS, kAnimationChunk, 1);
     }
     png_set_chunk_malloc_max(reader.png, 64 << 20);
-    // The sides are checked right after this, where the message can name them; nothing is allocated by them
-    // before.
+    // The caller checks the size afterwards, with a message that contains it. Nothing depends on it before.
     png_set_user_limits(reader.png, PNG_UINT_31_MAX, PNG_UINT_31_MAX);
     png_read_info(reader.png, reader.info);
     return true;
@@ -121,7 +121,7 @@ bool ReadHeader(Reader& reader, ImageSource& source, Purpose purpose, std::strin
                      png_get_image_height(reader.png, reader.info), reason);
 }
 
-// Those that say what the numbers of a file look like.
+// Uses the file's ICC profile. Returns false if there is none or it cannot be used.
 bool UseProfile(Reader& reader, std::string& reason) {
     png_charp name = nullptr;
     int compression = 0;
@@ -155,7 +155,7 @@ bool AreOfSrgb(Chromaticities const& p) {
            isNear(p.blue, kSrgb.blue);
 }
 
-// Leaves a reason where a profile is ignored.
+// Sets reason if a profile is ignored.
 void ChooseColors(Reader& reader, std::string& reason) {
     if (UseProfile(reader, reason) || IsMarkedSrgb(reader)) return;
     png_fixed_point gamma = 0;
@@ -208,7 +208,7 @@ void FinishRow(Reader const& reader, unsigned char* row, std::size_t count) {
     PremultiplyPixels(row, count);
 }
 
-// An interlaced image comes in passes over the same rows; the last one completes each.
+// An interlaced image has several passes over the same rows. The last pass completes each row.
 bool ReadRows(Reader& reader, PixelBuffer const& image) {
     if (setjmp(png_jmpbuf(reader.png))) return false;
     for (int pass = 1; pass <= reader.passes; ++pass) {
@@ -266,7 +266,7 @@ int GetOrientation(Reader const& reader) {
     return hasExif ? ReadOrientation({data, size}) : 1;
 }
 
-// By the chunk of an animation's control, whose first number counts them.
+// Returns the number of frames from the animation control chunk, whose first number it is.
 int CountFrames(Reader const& reader) {
     png_unknown_chunkp chunks = nullptr;
     int const count = png_get_unknown_chunks(reader.png, reader.info, &chunks);
@@ -307,7 +307,7 @@ struct Writer {
 };
 
 void OnWrite(png_structp png, png_bytep data, std::size_t count) {
-    // The file knows the reason, so the message stays empty.
+    // AtomicFile has the reason, so the message is empty.
     if (!static_cast<Writer*>(png_get_io_ptr(png))->file->Write(data, count)) png_error(png, "");
 }
 
@@ -349,7 +349,7 @@ bool Encode(PixelView const& view, int, AtomicFile& file, std::string& reason) {
     Writer writer;
     PixelBuffer row;
     if (!row.Allocate({view.size.width, 1}, reason)) return false;
-    // Without alpha the file is smaller and says truly that it has none.
+    // An opaque image is saved without alpha: the file is smaller, and its header says that it has no alpha.
     if (OpenWriter(writer, file) && WriteRows(writer, view, view.IsOpaque(), row.Row(0))) return true;
     reason = writer.error.text;
     return false;

@@ -8,7 +8,7 @@
 namespace Moka::detail {
 namespace {
 
-// x / 255 rounded to nearest for every product of two bytes, without a division.
+// Computes x / 255, rounded to nearest, without a division. Exact for every product of two bytes.
 constexpr unsigned DivideBy255(unsigned x) { return (x + 128 + ((x + 128) >> 8)) >> 8; }
 
 // ceil(2^24 / alpha). (n * reciprocal) >> 24 is n / alpha for every n below 2^16, and the product stays in 32

@@ -7,7 +7,7 @@
 namespace Moka::detail {
 namespace {
 
-// The weights of one target pixel along one axis add up to this.
+// Returns the sum of the weights of one target pixel along one axis.
 std::int32_t TotalWeight(int from, int to) { return static_cast<std::int32_t>(to > from ? 2 * to : from); }
 
 } // namespace
@@ -79,7 +79,7 @@ void RowScaler::PushShrinking() {
     Add(mSums.get(), isFirst ? mDown.firstWeight : isLast ? mDown.lastWeight : inner);
     if (!isLast) return;
     Emit();
-    // The rest of a row that two target rows share.
+    // If the row belongs to two target rows, add its rest to the second one.
     if (mTargetRow < mTo.height && mDown.first == mSourceRow) Add(mSums.get(), mDown.firstWeight);
 }
 
@@ -113,9 +113,9 @@ void RowScaler::Add(std::int32_t const* sums, std::int32_t weight) {
     for (std::size_t i = 0; i < mChannels; ++i) totals[i] += static_cast<double>(sums[i]) * weight;
 }
 
-// total / area rounded to nearest is (2 * total + area) / (2 * area) rounded down. Half a unit more changes
-// no result, but lets a product with the reciprocal, whose error is below 2^-42, stand for the division:
-// quotients that differ at all differ by at least 1 / (2 * area), which is above 2^-36.
+// total / area rounded to nearest equals (2 * total + area) / (2 * area) rounded down. Adding half a unit
+// changes no result and allows a multiplication by the reciprocal, whose error is below 2^-42, instead of a
+// division: different quotients differ by at least 1 / (2 * area), which is above 2^-36.
 void RowScaler::Emit() {
     double const area =
         static_cast<double>(TotalWeight(mFrom.width, mTo.width)) * TotalWeight(mFrom.height, mTo.height);

@@ -1,8 +1,9 @@
-// RowScaler: resamples a premultiplied RGBA8 image to another size while its rows arrive, so that the image
-// itself need not be held. Per axis: area averaging when it shrinks (each source pixel weighs exactly what it
-// covers), bilinear between pixel centres, edges repeated, when it grows.
-// Cost:  the weights are integers and the result is rounded once, to nearest: it does not depend on the order
-//        of the axes, a single colour stays what it is, and no colour exceeds its alpha if none did before.
+// RowScaler: scales a premultiplied RGBA8 image row by row, so that the source need not be in memory. An axis
+// that shrinks uses area averaging, weighted exactly by coverage. An axis that grows is bilinear between
+// pixel centres, with repeated edges.
+// Exact: weights are integers, and the result is rounded once, to nearest. So it does not depend on the order
+// of the
+//        axes, an image of one colour keeps it, and no colour exceeds its alpha unless it did before.
 // Limits: sides up to 65,535, which keeps every sum exact.
 #pragma once
 
@@ -24,20 +25,20 @@ struct PixelSize {
 
 class RowScaler : NonAssignable {
 public:
-    // out receives to.width * to.height pixels. It may be the memory the source rows are pushed from, first
-    // to last, when neither axis grows: a finished row never reaches what is still to come.
+    // out receives to.width * to.height pixels. If no axis grows, out may be the memory of the source rows: a
+    // finished row never overwrites a row that was not pushed yet.
     RowScaler(PixelSize from, PixelSize to, unsigned char* out);
     ~RowScaler();
 
-    // False when memory ran out; nothing may be pushed then.
+    // False if memory ran out. Push must not be called then.
     bool IsReady() const;
 
-    // The next source row, from.width pixels; exactly from.height of them.
+    // Adds the next source row of from.width pixels. Call it exactly from.height times.
     void Push(unsigned char const* row);
 
 private:
-    // What one target pixel takes from one axis: the source pixels first ... last, the inner ones with the
-    // axis's own inner weight. A single one carries firstWeight alone.
+    // The source pixels first ... last of one target pixel along one axis, and their weights. Inner pixels
+    // have the inner weight of the axis. A single pixel has firstWeight.
     struct Taps {
         int first;
         int last;
@@ -57,11 +58,11 @@ private:
     PixelSize mFrom;
     PixelSize mTo;
     unsigned char* mOut;
-    std::size_t mChannels; // of a target row
+    std::size_t mChannels; // the number of bytes of a target row
     std::unique_ptr<Taps[]> mAcross;
     std::unique_ptr<std::int32_t[]> mSums;     // the row just pushed, scaled across
-    std::unique_ptr<std::int32_t[]> mPrevious; // the one before, when growing
-    std::unique_ptr<double[]> mTotals;         // the target row under way; whole numbers, below 2^43
+    std::unique_ptr<std::int32_t[]> mPrevious; // the row before, for growing
+    std::unique_ptr<double[]> mTotals;         // the current target row; whole numbers below 2^43
     Taps mDown{};
     int mSourceRow = 0;
     int mTargetRow = 0;

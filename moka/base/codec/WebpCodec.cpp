@@ -1,6 +1,6 @@
-// WebpCodec.cpp: WebP through libwebp; of an animation the first frame, on a transparent canvas. Quality 100
-// is lossless, below it lossy with lossless alpha. The library holds a decoded lossless image once more inside
-// while it decodes.
+// WebpCodec.cpp: WebP with libwebp. Of an animation it decodes the first frame, on a transparent canvas.
+// Quality 100 is lossless; lower ones are lossy with lossless alpha. While it decodes a lossless image, the
+// library holds another copy.
 #include "moka/base/codec/ColorTransform.h"
 #include "moka/base/codec/Exif.h"
 #include "moka/base/codec/ImageCodec.h"
@@ -15,7 +15,7 @@
 namespace Moka::detail {
 namespace {
 
-// The header with every chunk a still image may have before its data.
+// Enough for the header and all chunks that a still image may have before its data.
 constexpr std::uint64_t kFirstPrefix = 4096;
 constexpr int kLosslessQuality = 100;
 // Measured (bench/codec) against level 2: ink pages come out a fifth smaller for a sixth more time, photos 6
@@ -67,7 +67,7 @@ struct DemuxDeleter {
 };
 using Demuxer = std::unique_ptr<WebPDemuxer, DemuxDeleter>;
 
-// The chunks of a file that has more of them than pixels; null without those, and when the file is damaged.
+// Returns the demuxer of a file with metadata or animation chunks; null if it has none or is damaged.
 Demuxer OpenChunks(ByteSpan file, WebPDemuxState& state) {
     constexpr std::uint32_t kKnown = ICCP_FLAG | EXIF_FLAG | ANIMATION_FLAG;
     constexpr std::size_t kFlags = 20;
@@ -77,7 +77,7 @@ Demuxer OpenChunks(ByteSpan file, WebPDemuxState& state) {
     return Demuxer(WebPDemuxPartial(&data, &state));
 }
 
-// Of the file's own bytes; empty when there is none.
+// Returns the chunk's bytes in the file; empty if there is none.
 ByteSpan FindChunk(Demuxer const& chunks, char const* name) {
     WebPChunkIterator found = {};
     if (!chunks || !WebPDemuxGetChunk(chunks.get(), name, 1, &found)) return {};
@@ -86,7 +86,7 @@ ByteSpan FindChunk(Demuxer const& chunks, char const* name) {
     return content;
 }
 
-// What is said behind the pixels makes it read the whole file.
+// Reads the metadata. If chunks follow the pixels, it reads the whole file.
 bool ReadChunks(ImageSource& source, ImageInfo& info, std::string& reason) {
     ByteSpan file;
     if (!source.Prefix(kFirstPrefix, file, reason)) return false;
@@ -111,17 +111,18 @@ bool ReadInfo(ImageSource& source, ImageInfo& info, std::string& reason) {
     return true;
 }
 
-// Where pixels go: a part of an image, whose rows are a stride apart.
+// The destination of pixels: a part of an image, with its stride.
 struct Target {
     unsigned char* pixels;
     PixelSize size;
     std::size_t stride;
 };
 
-// Straight alpha, because the library's own premultiplying does not round to nearest.
+// Decodes to straight alpha, because the library's premultiplication does not round to nearest.
 bool DecodePixels(ByteSpan file, bool isScaled, Target const& target, std::string& reason) {
     WebPDecoderConfig config;
-    if (!WebPInitDecoderConfig(&config)) return Refuse(reason, "libwebp does not fit the one built against");
+    if (!WebPInitDecoderConfig(&config))
+        return Refuse(reason, "the installed libwebp does not match the one at build time");
     config.options.use_scaling = isScaled;
     config.options.scaled_width = target.size.width;
     config.options.scaled_height = target.size.height;
@@ -136,7 +137,7 @@ bool DecodePixels(ByteSpan file, bool isScaled, Target const& target, std::strin
     return status == VP8_STATUS_OK || Refuse(reason, Describe(status));
 }
 
-// Leaves a reason where the file's profile is ignored.
+// Converts colours and premultiplies. Sets reason if the file's profile is ignored.
 void FinishPixels(Demuxer const& chunks, PixelBuffer const& image, std::string& reason) {
     ColorTransform colors;
     ByteSpan const profile = FindChunk(chunks, "ICCP");
@@ -172,7 +173,7 @@ bool Decode(ImageSource& source, PixelSize target, PixelBuffer& image, std::stri
     if (!source.Prefix(source.GetSize(), file, reason)) return false;
     PixelSize const own{features.width, features.height};
     PixelSize const wanted = ChooseSize(target, own);
-    // The library's scaler is an area filter too, but only where both axes shrink.
+    // The library's scaler averages areas only if both axes shrink.
     bool const isScaledByLibrary =
         !features.has_animation && wanted != own && wanted.width <= own.width && wanted.height <= own.height;
     if (!image.Allocate(isScaledByLibrary ? wanted : own, reason)) return false;
@@ -236,7 +237,7 @@ bool Encode(PixelView const& view, int quality, AtomicFile& file, std::string& r
     Picture owner;
     WebPPicture& picture = owner.picture;
     if (!WebPPictureInit(&picture) || !MakeConfig(quality, config)) {
-        return Refuse(reason, "libwebp does not fit the one built against");
+        return Refuse(reason, "the installed libwebp does not match the one at build time");
     }
     picture.use_argb = 1;
     picture.width = view.size.width;

@@ -9,20 +9,20 @@ namespace {
 
 constexpr jint kJniVersion = JNI_VERSION_1_6;
 
-// The two platforms' jni.h disagree about AttachCurrentThread's first parameter.
+// The type of AttachCurrentThread's first parameter differs between Android's and the JDK's jni.h.
 #ifdef __ANDROID__
 using AttachedEnv = JNIEnv;
 #else
 using AttachedEnv = void;
 #endif
 
-// The system's name for this thread, so that a debugger shows one name on both sides.
+// The system's name of this thread, so that debuggers show the same name for Java and native code.
 struct ThreadName {
-    char text[16] = {}; // as long as the system keeps
+    char text[16] = {}; // the system's limit
 
     ThreadName() {
         prctl(PR_GET_NAME, text);
-        // A cut or foreign name need not be the modified UTF-8 that a VM may insist on.
+        // The name may not be valid modified UTF-8, which a VM may require.
         for (char& c : text) {
             if (static_cast<unsigned char>(c) >= 0x80) c = '?';
         }
@@ -53,7 +53,7 @@ JNIAutoThread::JNIAutoThread(JavaVM* vm) : mVm(vm) {
     if (!mHasAttached) {
         mEnv = nullptr;
         __android_log_print(ANDROID_LOG_ERROR, "mok_log",
-                            "JNIAutoThread: the Java VM does not take thread '%s' (status %d)", name.text,
+                            "JNIAutoThread: the Java VM refuses thread '%s' (status %d)", name.text,
                             static_cast<int>(status));
     }
 }

@@ -1,9 +1,9 @@
-// JNIAutoThread: makes the calling thread usable for JNI for the length of a scope.
-// Owner:   the stack frame that makes it. Detaches only what it attached itself: in a thread of Java's, in
-//          one that somebody else attached, and inside another JNIAutoThread it changes nothing.
-// Thread:  made, used and destroyed on one thread; any number of threads at a time.
-// Fails:   GetEnv gives null, after one error line, when there is no VM or it refuses the thread.
-// Cost:    attaching makes a Java thread object. Around many short calls, hold one outside.
+// JNIAutoThread: attaches the calling thread to the Java VM for a scope.
+// Owner:   a local variable. It detaches the thread only if it attached it. On Java threads, on threads that
+//          other code has attached, and inside another JNIAutoThread it changes nothing.
+// Thread:  created, used and destroyed on one thread; any number of threads at a time.
+// Fails:   if there is no VM or the VM refuses the thread, logs an error, and GetEnv returns null.
+// Cost:    attaching creates a Java thread object. Around many short calls, create one outside.
 #pragma once
 
 #include "moka/base/Export.h"
@@ -16,10 +16,10 @@ namespace Moka {
 class MOKA_API JNIAutoThread : NonAssignable {
 public:
     explicit JNIAutoThread(JavaVM* vm);
-    // Local references made on a thread that this attached end here.
+    // Detaches the thread if the constructor attached it. This ends its local references.
     ~JNIAutoThread();
 
-    // Valid on this thread until destruction; null when the thread could not be attached.
+    // The environment, valid on this thread until destruction. Null if the thread could not be attached.
     JNIEnv* GetEnv() const { return mEnv; }
 
 private:

@@ -15,7 +15,7 @@
 namespace Moka {
 namespace {
 
-// More than a conversion makes, with the description of an exception.
+// More local references than a conversion creates, including the description of an exception.
 constexpr jint kLocalReferences = 24;
 
 bool Refuse(char const* reason) {
@@ -37,7 +37,7 @@ private:
     bool const mIsPushed;
 };
 
-// The head of a Java string, as modified UTF-8.
+// The beginning of a Java string, in modified UTF-8.
 struct Text {
     static constexpr jsize kUnits = 200;
     char bytes[kUnits * 3 + 1] = {};
@@ -58,7 +58,7 @@ void Describe(JNIEnv* env, jthrowable thrown, Text* text) {
     text->Read(env, static_cast<jstring>(string));
 }
 
-// Clears and logs the pending exception as that of a call. False when there is none.
+// Clears and logs the pending exception of a call. Returns false if there is none.
 bool LogException(JNIEnv* env, char const* call) {
     jthrowable const thrown = env->ExceptionOccurred();
     if (!thrown) return false;
@@ -69,8 +69,8 @@ bool LogException(JNIEnv* env, char const* call) {
     return true;
 }
 
-// Null, and logged, when the object has no such method. By the object's own class: a native thread's class
-// loader need not know it.
+// If the object has no such method, logs an error and returns null. Uses the object's class, because the
+// class loader of a native thread may not find it.
 jmethodID FindMethod(JNIEnv* env, jobject object, char const* name, char const* signature) {
     jmethodID const method = env->GetMethodID(env->GetObjectClass(object), name, signature);
     return LogException(env, name) ? nullptr : method;
@@ -152,7 +152,7 @@ void RemovePadding(unsigned char* pixels, Layout const& layout) {
     std::size_t const stride = static_cast<std::size_t>(layout.width) * 4;
     if (sourceStride == stride) return;
     std::size_t const rows = static_cast<std::size_t>(layout.height);
-    // Forwards in place: a row never reaches past where it came from.
+    // Moves rows forward in place: a row never overwrites the rows after it.
     for (std::size_t row = 1; row < rows; ++row) {
         std::memmove(pixels + row * stride, pixels + row * sourceStride, stride);
     }
@@ -184,7 +184,7 @@ void Recycle(JNIEnv* env, jobject javaBitmap) {
 
 bool JNI_ConvertJavaToBitmap(JNIEnv* env, jobject javaBitmap, Bitmap* bitmap, bool recycleAfter) {
     if (!env) return Refuse("the thread has no JNIEnv");
-    // Before all else: what describes an exception makes local references too.
+    // First of all, because describing an exception creates local references as well.
     LocalFrame const frame(env);
     if (!frame.IsPushed()) {
         env->ExceptionClear();

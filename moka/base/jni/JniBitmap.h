@@ -1,9 +1,9 @@
-// JNI_ConvertJavaToBitmap: the pixels of an android.graphics.Bitmap as a Bitmap.
-// Owner:   the pixels are copied: the bitmap owns its buffer (stride width * 4), and keeps nothing of Java's.
-// Thread:  one that env belongs to.
-// Fails:   false and one error line that gives the reason; bitmap is untouched and no Java exception is left
-//          pending, not even one that was before.
-// Cost:    one buffer of the Java bitmap's size; a second pass only when its rows are padded.
+// JNI_ConvertJavaToBitmap: copies the pixels of an android.graphics.Bitmap to a Bitmap.
+// Owner:   the bitmap owns its buffer (stride width * 4), and keeps no reference to Java objects.
+// Thread:  the thread of env.
+// Fails:   logs an error with the reason and returns false. bitmap does not change, and no Java exception is
+//          left pending, not even one from before the call.
+// Cost:    one buffer of the Java bitmap's size; a second pass only if its rows are padded.
 #pragma once
 
 #include "moka/base/Export.h"
@@ -14,10 +14,10 @@ namespace Moka {
 
 class Bitmap;
 
-// bitmap has no pixels yet. The Java bitmap must be of the configuration ARGB_8888, whose bytes lie R, G, B,
-// A; they come over bit for bit: premultiplied, as Java keeps them unless the bitmap's owner asked otherwise.
-// The limits are BitmapFactory's. recycleAfter: recycles the Java bitmap once it is converted; a recycling
-// that fails is logged and takes nothing back. No local reference is left behind.
+// bitmap must not have pixels. The Java bitmap must have the configuration ARGB_8888, whose bytes are R, G,
+// B, A. The bytes are copied unchanged; in Java they are premultiplied by default. The limits are those of
+// BitmapFactory. With recycleAfter the Java bitmap is recycled after the conversion; if that fails, it is
+// logged, and the conversion still succeeds. No local reference is left.
 MOKA_API bool JNI_ConvertJavaToBitmap(JNIEnv* env, jobject javaBitmap, Bitmap* bitmap, bool recycleAfter);
 
 } // namespace Moka

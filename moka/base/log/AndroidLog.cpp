@@ -13,14 +13,14 @@
 namespace Moka {
 namespace {
 
-// Recursive, so that a sink that logs does not wait for itself; the depth sends its line to stderr.
+// The mutex is recursive, so that a sink may log. The line of a sink goes to stderr, by the depth.
 struct SinkSlot {
     std::recursive_mutex mutex;
     LogSink sink;
     int depth = 0;
 };
 
-// Never destroyed: destructors of other statics log.
+// Never destroyed, because destructors of other static objects log.
 SinkSlot& Slot() {
     static SinkSlot& slot = *new SinkSlot;
     return slot;
@@ -51,7 +51,7 @@ std::string Format(char const* format, va_list arguments) {
     char brief[256];
     va_list again;
     va_copy(again, arguments);
-    // NOLINTBEGIN(clang-analyzer-valist.Uninitialized): both are, by the caller and by va_copy
+    // NOLINTBEGIN(clang-analyzer-valist.Uninitialized): the caller and va_copy initialise them
     int const length = std::vsnprintf(brief, sizeof brief, format, arguments);
     std::size_t const size = length > 0 ? static_cast<std::size_t>(length) : 0;
     std::string text;
@@ -76,7 +76,7 @@ bool GiveToSink(LogLine const& line) {
     try {
         sink(line);
     } catch (...) {
-        taken = false; // whoever logs expects no exception, so the line goes where it is seen
+        taken = false; // logging must not throw, so the line goes to stderr
     }
     --slot.depth;
     return taken;
@@ -87,7 +87,7 @@ int WriteToStderr(int priority, char const* tag, std::string const& text) {
     whole.reserve(std::strlen(tag) + text.size() + 5);
     whole.append(1, LevelOf(priority)).append(1, ' ').append(tag).append(": ");
     whole.append(text).append(1, '\n');
-    // One call, since stderr is not buffered: what is formatted into it can reach the file in pieces.
+    // One call, because stderr is not buffered: formatted output could be written in pieces.
     return static_cast<int>(std::fwrite(whole.data(), 1, whole.size(), stderr));
 }
 
@@ -121,7 +121,7 @@ extern "C" int __android_log_print(int priority, char const* tag, char const* fo
     int written = 0;
     try {
         written = Moka::Print(priority, tag, format, arguments);
-    } catch (...) { // out of memory: what needs none
+    } catch (...) { // out of memory: write the format, which needs none
         written = std::fprintf(stderr, "%c %s: %s\n", Moka::LevelOf(priority), tag, format);
     }
     va_end(arguments);

@@ -1,6 +1,8 @@
-/// AndroidLog.h: the one way this tree logs, __android_log_print. On Android it is the system's; elsewhere the
-/// library built from this folder supplies the symbol and writes "LEVEL tag: text" to stderr.
-/// Thread: any. A line is written in one piece. Cost: a format and a write; never called on a hot path.
+/// AndroidLog.h: declares __android_log_print, the only function that the libraries log with. On Android the
+/// system defines it. On other systems the library of this folder does, and writes "LEVEL tag: text" to
+/// stderr.
+/// Thread: any. A line is written in one piece.
+/// Cost:   formats and writes the text. Not for hot paths.
 #pragma once
 
 #ifdef __ANDROID__
@@ -8,7 +10,7 @@
 #else
 #include "moka/base/Export.h"
 
-/// The priorities that are used; the numbers are the platform's.
+/// The priorities in use, with Android's numbers.
 enum android_LogPriority {
     ANDROID_LOG_DEBUG = 3,
     ANDROID_LOG_INFO = 4,

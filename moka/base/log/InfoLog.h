@@ -1,4 +1,4 @@
-// InfoLog: writes info lines under one tag.
+// InfoLog: logs lines of info priority with one tag.
 //     constexpr InfoLog LogInfo{"mok_log"};
 //     LogInfo("queue size(%d)", size);
 #pragma once

@@ -1,8 +1,8 @@
-/// LogSink.h: lets a host or a test see every log line instead of having it written to stderr. Not on Android,
-/// where the system owns the log.
-/// Thread: a sink is called on the thread that logs, one line at a time; it may log itself (that line goes to
-///         stderr), but must not wait for another thread that logs. A line whose sink throws goes to stderr.
-///         Installing and removing waits for a running call, except from inside it.
+/// LogSink.h: passes every log line to a function of the host or a test, instead of writing it to stderr. Not
+/// available on Android.
+/// Thread: the sink is called on the thread that logs, one line at a time. It may log; that line goes to
+///         stderr. It must not wait for another thread that logs. If the sink throws, the line goes to
+///         stderr. SetLogSink waits for a running call, except inside of it.
 #pragma once
 
 #include "moka/base/Export.h"
@@ -14,21 +14,20 @@ namespace Moka {
 
 /// One line of the log.
 struct LogLine {
-    int priority; ///< an android_LogPriority
-    /// The tag.
-    std::string tag;    //
-    std::string format; ///< the format as the caller wrote it
-    std::string text;   ///< the formatted line, without a line end
+    int priority;       ///< an android_LogPriority
+    std::string tag;    ///< the tag
+    std::string format; ///< the format string of the caller
+    std::string text;   ///< the formatted line, without a line break
 };
 
 /// Receives log lines.
 using LogSink = std::function<void(LogLine const&)>;
 
-/// Replaces the sink; an empty one goes back to stderr. Returns the sink that was installed before.
+/// Installs a sink and returns the previous one. With an empty sink, lines go to stderr again.
 MOKA_API LogSink SetLogSink(LogSink sink);
 
-/// Lines below this priority are not written to stderr (a sink still sees them). The default is
-/// ANDROID_LOG_INFO.
+/// Sets the lowest priority that is written to stderr. The default is ANDROID_LOG_INFO. A sink gets all
+/// lines.
 MOKA_API void SetLogPriority(int lowest);
 
 } // namespace Moka

@@ -1,7 +1,7 @@
-// BitmapCreation.h: creates bitmaps after checking the request, for the factory and for those below it: clones
-// and the copy of a destination.
-// Owner:  as MKGraphicsFactory: each result carries one reference for the caller.
-// Fails:  null. An invalid size, queue or parent logs an error.
+// BitmapCreation.h: validates the arguments and creates bitmaps. The factory, clones and the copy of a
+// destination use it.
+// Owner:  each function returns one reference, as those of MKGraphicsFactory do.
+// Fails:  returns null. An invalid size, queue or parent logs an error.
 #pragma once
 
 namespace Moka {
@@ -11,10 +11,10 @@ class IMKBitmap;
 
 namespace detail {
 
-// Logs an error unless there is a queue and both sides are positive.
+// Returns true if there is a queue and both sides are positive. Otherwise logs an error.
 bool IsValidBitmap(IGLMsgQueue* queue, int width, int height);
 
-// As the factory's functions of the same arguments.
+// See the functions of MKGraphicsFactory with the same arguments.
 IMKBitmap* CreateTextureBitmap(IGLMsgQueue* queue, int width, int height, void const* pixels,
                                bool deleteBuffer, int useQueue, bool textureFlag);
 IMKBitmap* CreateSharedBitmap(IGLMsgQueue* queue, IMKBitmap* parent, int useQueue);

@@ -1,7 +1,7 @@
-// BlockingRead: what a caller that waits for a read shares with the task that reads. It belongs to both, so a
-// task that runs after the caller has gone on writes into nothing of the caller's, and one that is dropped
-// leaves nothing behind.
-// Thread: the task finishes it on the render thread, the caller looks at it afterwards.
+// BlockingRead: the result of a blocking read, shared by the caller and the task. Both hold a reference, so a
+// task that runs after the caller has returned does not write into memory of the caller, and a dropped task
+// leaks nothing.
+// Thread: the task calls Finish() on the render thread; the caller reads the result afterwards.
 #pragma once
 
 #include "moka/base/Check.h"
@@ -17,7 +17,7 @@ class BlockingRead final : public RefCount {
 public:
     using Ptr = RefPtr<BlockingRead>;
 
-    // Null when memory runs out: the read then has no result.
+    // Returns null if memory runs out; the read then has no result.
     static Ptr Make() { return Ptr::Adopt(new (std::nothrow) BlockingRead); }
 
     void Finish(unsigned int pixel) {
@@ -25,12 +25,12 @@ public:
         mIsFinished.store(true, std::memory_order_release);
     }
 
-    // 0 while the read has not run.
+    // 0 until the read has run.
     static unsigned int GetPixel(Ptr const& read) {
         return read ? read->mPixel.load(std::memory_order_relaxed) : 0;
     }
 
-    // The caller's destination may be gone when a late read writes there.
+    // Debug check: a read that runs after WaitForTasks might write to a destination that no longer exists.
     static void CheckFinished([[maybe_unused]] Ptr const& read, [[maybe_unused]] bool accepted) {
         MOKA_CHECK(!accepted || !read || read->mIsFinished.load(std::memory_order_acquire),
                    "WaitForTasks returned and the queue has not caught up with a read that it accepted");

@@ -2,8 +2,8 @@
 /// Owner:   reference counted; a creating function returns one reference.
 /// Thread:  caller-side bitmaps from any thread, render-thread bitmaps on the render thread only. The tag is
 ///          not synchronised.
-/// The four capability getters say what a bitmap can do: each returns null for a capability that it lacks;
-/// nobody casts.
+/// The four capability getters return the interfaces that a bitmap supports, and null for the others. Do not
+/// cast.
 #pragma once
 
 #include "moka/graphics/bitmap/IMKBitmapDataGettable.h"
@@ -25,22 +25,24 @@ public:
     virtual int GetHeight() const = 0;
     virtual Rect GetBitmapRect() = 0;
 
-    /// A label for logs and GL debuggers; the first 126 bytes are kept, null is ignored.
+    /// A label for logs and GL debuggers. The first 126 bytes are kept; null is ignored.
     virtual void SetTag(char const* tag) = 0;
     virtual char const* GetTag() = 0;
 
-    /// A caller-side bitmap over the same image, holding one reference; of a screen bitmap, over the other of
-    /// the host's two frame buffers. Null without a queue and when memory runs out.
+    /// Returns a new caller-side bitmap that shares this image, with one reference. The clone of a screen
+    /// bitmap draws into the other frame buffer of the host: the current one instead of the default one, or
+    /// the reverse. Returns null without a queue, or if memory runs out.
     virtual IMKBitmap* Clone() = 0;
 
     /// The queue that it was created with; may be null.
     virtual IGLMsgQueue* GetMsgQueue() = 0;
 
-    /// Takes or drops a reference; the count afterwards. The last Unref deletes the bitmap.
+    /// Take or drop a reference, and return the count afterwards. The last Unref deletes the bitmap.
     virtual int Ref() = 0;
     virtual int Unref() = 0;
 
-    /// The capabilities: sampling, drawing onto it, canvases, strips. Null if it lacks one. No new reference.
+    /// The capabilities: sampling, drawing into it, canvases, strips. Null if the bitmap lacks one. The
+    /// caller gets no reference.
     virtual IMKBitmapReadable* GetBitmapReadable() = 0;
     virtual IMKBitmapWritable* GetBitmapWritable() = 0;
     virtual IMKBitmapCanvasAttachable* GetBitmapCanvasAttachable() = 0;

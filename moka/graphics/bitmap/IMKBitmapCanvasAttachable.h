@@ -1,7 +1,7 @@
-/// IMKBitmapCanvasAttachable: how a canvas announces itself to its target bitmap. Attaching takes one
-/// reference on the bitmap and makes it drawable; detaching undoes both.
+/// IMKBitmapCanvasAttachable: canvases attach themselves to their target bitmap with it. Attaching takes one
+/// reference on the bitmap and creates its frame buffers; detaching undoes both.
 /// Thread:  the plain operations from any thread, those ending in RT on the render thread, where `release`
-///          drops one reference more.
+///          drops one more reference.
 #pragma once
 
 namespace Moka {
@@ -16,9 +16,9 @@ public:
     virtual void AttachToCanvasRT(bool release) = 0;
     virtual void DetachFromCanvasRT(bool release) = 0;
 
-    /// Whether drawing into a strip, or with -1 into the bitmap as one frame buffer, reaches the bitmap. It
-    /// does not where the frame buffer could not be created, or not yet; a draw would then go to the frame
-    /// buffer that the host has bound.
+    /// True if the strip has a frame buffer; -1 asks for the bitmap as one frame buffer. If the frame buffer
+    /// does not exist yet or could not be created, a draw would go to the frame buffer that the host has
+    /// bound.
     virtual bool HasFrameBufferRT(int /*strip*/) { return true; }
 };
 

@@ -1,6 +1,6 @@
 /// IMKBitmapWritable: a bitmap, or a strip of one, as a render target.
-/// Thread: the two plain operations post; those ending in RT run on the render thread, where `release` says
-///         whether to drop one reference at the end (true when reached through a task).
+/// Thread: the functions ending in RT run on the render thread at once; with `release` they drop one
+///         reference at the end, which tasks need. ActivateFrameBuffer and DeactivateFrameBuffer are posted.
 #pragma once
 
 #include "moka/graphics/math/Matrix4.h"
@@ -19,19 +19,20 @@ class IMKBitmapWritable {
 public:
     virtual ~IMKBitmapWritable() = default;
 
-    /// Orthographic, from the bitmap's pixel space to clip space.
+    /// The orthographic matrix from the bitmap's pixels to clip space.
     virtual Matrix4<float> GetProjectionMatrix() = 0;
 
-    /// Makes the bitmap the draw target, or ends drawing onto it.
+    /// Make the bitmap the draw target, or end drawing into it.
     virtual void ActivateFrameBuffer() = 0;
     virtual void DeactivateFrameBuffer(DiscardFramebufferType discard) = 0;
 
-    /// The same at once.
+    /// The same functions, executed at once.
     virtual void ActivateFrameBufferRT(bool release) = 0;
     virtual void DeactivateFrameBufferRT(bool release, DiscardFramebufferType discard) = 0;
 
-    /// Components 0 ... 1, premultiplied.
+    /// Clears the colour within the scissor. Components 0 ... 1, premultiplied.
     virtual void ClearColorRT(float r, float g, float b, float a) = 0;
+    /// Clears the depth, the stencil, or both, within the scissor.
     virtual void ClearDepthStencilRT(bool clearDepth, float depth, bool clearStencil, int stencil) = 0;
 };
 

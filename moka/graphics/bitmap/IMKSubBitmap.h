@@ -18,7 +18,8 @@ class IMKSubBitmap : public IMKBitmapWritable,
                      public IMKBitmapBufferUpdatable,
                      public IMKBitmapDataGettable {
 public:
-    /// The band number: differs from the position in the list only for bitmaps of a region.
+    /// The index of the strip in the whole image. It differs from the position in the list only for bitmaps
+    /// that hold a region of an image.
     virtual int GetBitmapIndex() = 0;
     virtual int GetX() = 0;
     virtual int GetY() = 0;
@@ -26,22 +27,23 @@ public:
     virtual int GetHeight() = 0;
     virtual Rect GetBitmapRect() = 0;
 
-    /// Null until the render thread has created it, or if it could not.
+    /// The strip's texture. Null until the render thread has created it, or if that failed.
     virtual ITextureObject* GetTexture() = 0;
 
-    /// One reference on the frame buffer for each attached canvas.
+    /// Take or drop a reference on the strip's frame buffer. The first one creates it, the last one deletes
+    /// it. Each attached canvas holds one.
     virtual void CreateFrameBuffer() = 0;
     virtual void ReleaseFrameBuffer() = 0;
     virtual void CreateFrameBufferRT(bool release) = 0;
     virtual void ReleaseFrameBufferRT(bool release) = 0;
 
-    /// As IMKBitmap.
+    /// As in IMKBitmap.
     virtual void SetTag(char const* tag) = 0;
     virtual IGLMsgQueue* GetMsgQueue() = 0;
     virtual int Ref() = 0;
     virtual int Unref() = 0;
 
-    /// A strip with its own copy of the image, holding one reference; null when memory runs out.
+    /// Returns a new strip with its own copy of the image and one reference. Null if memory runs out.
     virtual IMKSubBitmap* Clone() = 0;
 };
 

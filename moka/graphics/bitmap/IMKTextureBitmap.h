@@ -9,9 +9,12 @@ class IMKSubBitmap;
 
 class IMKTextureBitmap : public IMKBitmapBufferUpdatable {
 public:
-    /// By position in the list of strips, top to bottom; null outside it. Not a new reference.
+    /// The strip at a position in the list, from top to bottom. Null outside the list. The caller gets no
+    /// reference.
     virtual IMKSubBitmap* GetSubBitmap(int index) = 0;
+    /// The number of strips.
     virtual int GetSubBitmapCount() = 0;
+    /// This object, as the interface for uploads.
     virtual IMKBitmapBufferUpdatable* GetBitmapBufferUpdatable() = 0;
 };
 

@@ -13,7 +13,7 @@ namespace {
 std::atomic<bool> useNativeDecoder{false};
 std::atomic<detail::JavaDecoder> javaDecoder{nullptr};
 
-// False when memory runs out.
+// Calls function. Returns false if memory runs out.
 template <class Function>
 bool WithoutThrowing(Function const& function) {
     try {

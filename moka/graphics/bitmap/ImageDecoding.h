@@ -1,6 +1,7 @@
-/// ImageDecoding: how the factory turns a file into pixels. "mki" files go to the base library's codec. Every
-/// other format is decoded by the platform's Java side once MKBitmapFactory_OnLoad has found it (see
-/// moka/graphics/jni/OnLoad.h), or, in a process without Java that says so once, by the base library as well.
+/// ImageDecoding: decodes image files for the factory. The base library decodes "mki" files. Java decodes all
+/// other formats, after MKBitmapFactory_OnLoad has found its classes (see moka/graphics/jni/OnLoad.h). A
+/// process without Java calls MKBitmapFactory_UseNativeDecoder() once; the base library then decodes all
+/// formats.
 #pragma once
 
 #include "moka/base/Export.h"
@@ -10,18 +11,19 @@ namespace Moka {
 class Bitmap;
 class String;
 
-/// The part after the last "." of path; the whole path without one. False when either is null.
+/// Sets *extension to the part of path after the last ".", or to the whole path if it has none. Returns false
+/// if an argument is null.
 MOKA_API bool GetExtensionByFile(String const* path, String* extension);
 
-/// Whether that is exactly extension; case matters. False when either is null.
+/// True if the extension of path equals `extension` exactly, including case. False if an argument is null.
 MOKA_API bool CompareExtensionByFile(String const* path, char const* extension);
 
-/// From now on files are decoded without Java. For hosts that have none; off by default. Any thread.
+/// Makes later calls decode files without Java. Off by default. Any thread.
 MOKA_API void MKBitmapFactory_UseNativeDecoder();
 
-/// Decodes a file other than "mki": scaled to width x height unless one of them is 0. Owned by the caller;
-/// null, with an error line, when it cannot be decoded or there is nothing to decode it with. Any thread:
-/// Java gets to know it for the call.
+/// Decodes a file other than "mki" and scales it to width x height, unless one of them is 0. The caller owns
+/// the result. Logs an error and returns null if the file cannot be decoded or no decoder is set. Any thread:
+/// the call attaches it to the Java VM if necessary.
 MOKA_API Bitmap* CreateBitmapJNI(String const* path, int width, int height);
 
 namespace detail {
@@ -29,7 +31,7 @@ namespace detail {
 using JavaDecoder = Bitmap* (*)(String const* path, int width, int height);
 void SetJavaDecoder(JavaDecoder decoder);
 
-/// Any file, by its extension.
+/// Decodes a file of any format, chosen by its extension.
 Bitmap* DecodeFile(String const* path, int width, int height);
 } // namespace detail
 

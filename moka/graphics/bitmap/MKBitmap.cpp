@@ -5,7 +5,7 @@
 #include <cstdint>
 
 namespace Moka {
-// A screen bitmap's numbers are nowhere checked.
+// Saturates, because nothing validates the numbers of a screen bitmap.
 MKBitmap::MKBitmap(IGLMsgQueue* queue, int x, int y, int width, int height)
     : mMsgQueue(queue),
       mBitmapRect(x, y, Saturate(std::int64_t{x} + width), Saturate(std::int64_t{y} + height)) {}

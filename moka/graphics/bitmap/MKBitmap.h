@@ -1,5 +1,5 @@
-// MKBitmap: what all bitmaps have in common: the queue, the rectangle, the tag and the reference count.
-// It offers no capability; the classes over it add theirs.
+// MKBitmap: the common part of all bitmaps: the queue, the rectangle, the tag and the reference count. It
+// supports no capability; derived classes add theirs.
 #pragma once
 
 #include "moka/base/Export.h"
@@ -11,7 +11,7 @@ namespace Moka {
 
 class MOKA_API MKBitmap : public IMKBitmap, public RefCount {
 public:
-    // Which of the host's frame buffers a screen bitmap stands for.
+    // The frame buffer of the host that a screen bitmap draws into.
     enum FramebufferType : int { DefaultFramebuffer = 0, CurrentFramebuffer = -1 };
 
     MKBitmap(IGLMsgQueue* queue, int x, int y, int width, int height);

@@ -1,5 +1,5 @@
 // MKDepthStencilBuffer: owns one combined depth and stencil buffer of the renderer.
-// Thread: render thread only; callers elsewhere route its deletion there.
+// Thread: render thread only. Other threads post its deletion.
 #pragma once
 
 #include "moka/base/Export.h"
@@ -15,7 +15,7 @@ public:
     MKDepthStencilBuffer& operator=(MKDepthStencilBuffer const&) = delete;
     virtual ~MKDepthStencilBuffer();
 
-    // Null when the renderer could not make it.
+    // Null if the renderer could not create it.
     IDepthStencilBuffer* GetDepthStencilBuffer() const { return mDepthStencilBuffer; }
 
 private:

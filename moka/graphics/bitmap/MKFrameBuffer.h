@@ -1,7 +1,7 @@
-// MKFrameBuffer: the off-screen render target over one strip's texture.
+// MKFrameBuffer: the off-screen render target that draws into one strip's texture.
 // Owner:  its strip. The reference count counts the canvases attached to the strip.
-// Thread: render thread only; callers elsewhere route its deletion there.
-// Fails:  without a render target (the renderer could not make it) every operation does nothing.
+// Thread: render thread only. Other threads post its deletion.
+// Fails:  if the renderer could not create the target, every operation does nothing.
 #pragma once
 
 #include "moka/base/Export.h"
@@ -15,7 +15,7 @@ class MKDepthStencilBuffer;
 
 class MOKA_API MKFrameBuffer : public RefCount {
 public:
-    // The size is the texture's; width and height are not looked at.
+    // Has the size of the texture. width and height are ignored.
     MKFrameBuffer(int width, int height, ITextureObject* texture);
     ~MKFrameBuffer() override;
 

@@ -33,7 +33,7 @@ void MKScreenBitmap::ActivateFrameBuffer() { PostSelf(&MKScreenBitmap::ActivateF
 
 unsigned int MKScreenBitmap::GetPixel(Point const& p) {
     unsigned int pixel = 0;
-    PostSelf(&MKScreenBitmap::getPixelRT, pixel, p); // writes into the task's copy
+    PostSelf(&MKScreenBitmap::getPixelRT, pixel, p); // writes into the task's copy of pixel
     mMsgQueue->WaitForTasks();
     return pixel;
 }

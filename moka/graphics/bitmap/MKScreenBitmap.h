@@ -1,8 +1,8 @@
-// MKScreenBitmap: a screen bitmap for use from any thread: each operation is posted to the render thread. See
-// MKScreenBitmapBase for what it can do.
-// Owner:  each posted operation holds one reference; if the queue refuses it, it is dropped and its
-//         reference is kept. // Compat: refused-post
-// Thread: any, except that the blocking reads wait for the render thread and so must not be called on it.
+// MKScreenBitmap: a screen bitmap for any thread: each operation is posted to the render thread.
+// MKScreenBitmapBase describes screen bitmaps.
+// Owner:  each posted operation holds one reference. If the queue refuses the operation, the reference is not
+//         dropped. // Compat: refused-post
+// Thread: any. The blocking reads wait for the render thread and must not be called on it.
 #pragma once
 
 #include "moka/base/RefPtr.h"
@@ -32,14 +32,14 @@ public:
     void GetBitmapDataAsync(Rect const& r, void* destination, void* userData, DataCallback callback) override;
 
 private:
-    // Run by tasks; each drops the task's reference at its end, also when a callback throws.
+    // Tasks call these. Each drops the task's reference at its end, also if a callback throws.
     void createRenderTargetRT(int width, int height, FramebufferType type, bool release);
     void getPixelRT(unsigned int& result, Point const& p);
     void getPixelAsyncRT(Point const& p, void* userData, PixelCallback callback);
     void getBitmapDataRT(Rect const& r, void* destination, RefPtr<detail::BlockingRead> const& read);
     void getBitmapDataAsyncRT(Rect const& r, void* destination, void* userData, DataCallback callback);
 
-    // Takes the task's reference and posts. False when the task never runs.
+    // Takes the task's reference and posts. Returns false if the task will never run.
     template <class F, class... Values>
     bool PostSelf(F function, Values&&... values);
 };

@@ -32,7 +32,7 @@ Matrix4<float> MKScreenBitmapBase::GetProjectionMatrix() {
     m[0] = 2.0f / w;
     m[5] = 2.0f / (0.0f - h);
     m[10] = -1.0f / 32767.0f;
-    m[12] = -w / w; // not a number without a width
+    m[12] = -w / w; // NaN if the width is 0
     m[13] = -h / (0.0f - h);
     m[14] = -0.0f;
     m[15] = 1.0f;

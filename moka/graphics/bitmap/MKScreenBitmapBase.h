@@ -1,14 +1,14 @@
-// MKScreenBitmapBase: the render side of a screen bitmap, shared by its two flavours: a bitmap that stands
-// for a frame buffer of the host's. It can be drawn into, not sampled.
-// Owner:  the bitmap owns its render target; the frame buffer stays the host's. Attaching a canvas only
-//         counts a reference.
-// Thread: the getters anywhere; everything ending in RT, and the protected bodies, on the render thread.
-// Fails:  without a render target (an unknown type gives one error line) nothing is drawn or read.
-// Units:  GetBitmapData gives the frame buffer's own rows, the bottom one first, counted from its corner, not
-//         from where the bitmap lies. GetPixel counts from the top but is one row off: row y reads row y - 1,
-//         and row 0 reads 0.
-// Limits: there is no stencil of ours: clips that need one (turned ones, and all operations but Intersect and
-//         Replace) do not work on a screen bitmap.
+// MKScreenBitmapBase: the render side of a screen bitmap, shared by its two flavours. A screen bitmap draws
+// into a frame buffer of the host. It cannot be sampled.
+// Owner:  the bitmap owns its render target; the host owns the frame buffer. Attaching a canvas only takes a
+//         reference.
+// Thread: the getters on any thread. Functions ending in RT and the protected ones on the render thread.
+// Fails:  without a render target nothing is drawn or read. An unknown type logs an error.
+// Units:  GetBitmapData returns the frame buffer's rows from bottom to top, relative to the frame buffer's
+//         corner, not to the bitmap's position. GetPixel counts rows from the top but is one row off: row y
+//         reads row y - 1, and row 0 reads 0.
+// Limits: the library attaches no stencil buffer to it. So clips that need the stencil (rotated ones, and all
+//         operations except Intersect and Replace) do not work on a screen bitmap.
 #pragma once
 
 #include "moka/graphics/bitmap/IMKBitmapCanvasAttachable.h"
@@ -23,14 +23,14 @@ class MOKA_API MKScreenBitmapBase : public MKBitmap,
                                     public IMKBitmapWritable,
                                     public IMKBitmapCanvasAttachable {
 public:
-    // The same rectangle, always caller-side, over the other of the two frame buffers: the type is passed
-    // where the factory takes a switch. // Compat: screen-clone
+    // Returns a caller-side bitmap with the same rectangle for the other of the two frame buffers, because
+    // the type is passed where the factory expects a switch. // Compat: screen-clone
     IMKBitmap* Clone() override;
 
     IMKBitmapWritable* GetBitmapWritable() override { return this; }
     IMKBitmapCanvasAttachable* GetBitmapCanvasAttachable() override { return this; }
 
-    // Row 0 maps to 1: the top of a bottom-up frame buffer. Where the bitmap lies does not enter.
+    // Maps row 0 to 1, the top of a bottom-up frame buffer. Ignores the bitmap's position.
     Matrix4<float> GetProjectionMatrix() override;
 
     void ActivateFrameBufferRT(bool release) override;
@@ -47,7 +47,7 @@ public:
 protected:
     MKScreenBitmapBase(IGLMsgQueue* queue, int x, int y, int width, int height, FramebufferType type);
 
-    // caller names whoever asks, in the error line.
+    // The error message contains caller.
     void CreateRenderTarget(int width, int height, FramebufferType type, char const* caller);
 
     unsigned int ReadPixel(Point const& p);

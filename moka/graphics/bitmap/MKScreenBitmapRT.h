@@ -1,6 +1,6 @@
-// MKScreenBitmapRT: a screen bitmap for code that already runs on the render thread: everything happens at
-// once, nothing is posted. See MKScreenBitmapBase for what it can do.
-// Thread: render thread only, its destruction included. Callbacks run before the call returns.
+// MKScreenBitmapRT: a screen bitmap for code that runs on the render thread: operations execute at once and
+// are not posted. MKScreenBitmapBase describes screen bitmaps.
+// Thread: render thread only, including destruction. Callbacks run before the call returns.
 #pragma once
 
 #include "moka/graphics/bitmap/MKScreenBitmapBase.h"

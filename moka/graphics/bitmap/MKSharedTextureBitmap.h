@@ -1,5 +1,5 @@
-// MKSharedTextureBitmap: a texture bitmap over another one's image. Drawing into either shows in both;
-// sampling state is each one's own. It keeps its parent alive for its whole life.
+// MKSharedTextureBitmap: a texture bitmap that shares the image of another one, its parent. Drawing into one
+// of them changes both. Each has its own sampling state. It holds a reference on its parent.
 #pragma once
 
 #include "moka/graphics/bitmap/MKTextureBitmap.h"
@@ -8,7 +8,7 @@ namespace Moka {
 
 class MOKA_API MKSharedTextureBitmap : public MKTextureBitmap {
 public:
-    // parent has a texture bitmap; the factory has looked.
+    // parent must be a texture bitmap; the factory checks this.
     MKSharedTextureBitmap(IGLMsgQueue* queue, IMKBitmap* parent, bool renderThread);
     ~MKSharedTextureBitmap() override;
 

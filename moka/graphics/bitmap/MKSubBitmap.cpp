@@ -28,7 +28,8 @@ MKSubBitmap::MKSubBitmap(IGLMsgQueue* queue, int index, Rect const& rect, IMKSub
 }
 
 MKSubBitmap::~MKSubBitmap() {
-    // The render thread runs these in order: unhook, then delete what was hooked, then what it was hooked to.
+    // The render thread runs these in order: detach the depth-stencil buffer, delete it, then delete the
+    // frame buffer.
     if (MKFrameBuffer* const frameBuffer = mFrameBuffer) {
         if (mDepthStencil) {
             WorkerTask::PostMember(mMsgQueue, frameBuffer, &MKFrameBuffer::DetachDepthStencilBufferRT);

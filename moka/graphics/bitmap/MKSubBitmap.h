@@ -1,9 +1,9 @@
-// MKSubBitmap: a strip for use from any thread: each operation is posted to the render thread.
-// Owner:  each posted operation holds one reference. Refused, the operation is dropped and its reference
-//         stays: the strip is then never deleted. // Compat: refused-post
-// Thread: any, except that the blocking reads wait for the render thread and so must not be called on it.
-// Cost:   one task a call; nothing is copied but the arguments, so pixels and destinations stay valid until
-//         run.
+// MKSubBitmap: a strip for any thread: each operation is posted to the render thread.
+// Owner:  each posted operation holds one reference. If the queue refuses the operation, the reference is not
+//         dropped, and the strip is never deleted. // Compat: refused-post
+// Thread: any. The blocking reads wait for the render thread and must not be called on it.
+// Cost:   each call posts one task. It copies only its arguments, so pixels and destinations must stay valid
+//         until the task has run.
 #pragma once
 
 #include "moka/base/RefPtr.h"
@@ -21,13 +21,13 @@ class BlockingRead;
 
 class MOKA_API MKSubBitmap : public MKSubBitmapBase {
 public:
-    // A texture over the strip's rows of pixels, an image `width` pixels wide that stays valid until the task
-    // has run; null for a transparent one.
+    // Creates the texture from the strip's rows of pixels, an image `width` pixels wide. pixels must stay
+    // valid until the task has run. If it is null, the texture is transparent.
     MKSubBitmap(IGLMsgQueue* queue, int index, Rect const& rect, int width, int height, void const* pixels,
                 bool textureFlag);
 
-    // A texture over the storage of model's. The model's texture is looked up when the task runs, because a
-    // model made a moment ago has none yet; a reference keeps the model until then.
+    // Creates a texture that shares the storage of the model's texture. The task looks that texture up when
+    // it runs, because a new model has none yet. A reference keeps the model alive until then.
     MKSubBitmap(IGLMsgQueue* queue, int index, Rect const& rect, IMKSubBitmap* model);
 
     ~MKSubBitmap() override;
@@ -52,7 +52,7 @@ public:
     IMKSubBitmap* Clone() override;
 
 private:
-    // Run by tasks; each drops the task's reference at its end, also when a callback throws.
+    // Tasks call these. Each drops the task's reference at its end, also if a callback throws.
     void createTextureRT(int x, int y, int rowLength, void const* pixels, bool textureFlag);
     void createSharedTextureRT(IMKSubBitmap* model);
     void attachDepthBufferRT();
@@ -68,7 +68,7 @@ private:
 
     Tag CopyTag();
 
-    // Takes the task's reference and posts. False when the task never runs.
+    // Takes the task's reference and posts. Returns false if the task will never run.
     template <class F, class... Values>
     bool PostSelf(F function, Values&&... values);
 

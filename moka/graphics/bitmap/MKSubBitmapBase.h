@@ -1,8 +1,7 @@
 // MKSubBitmapBase: the render side of a strip, shared by its two flavours: texture, frame buffer,
-// depth-stencil buffer, upload and read-back. MKSubBitmap reaches it through tasks, MKSubBitmapRT calls it at
-// once.
-// Owner:   the strip owns its GPU objects; how they die is the flavour's business.
-// Thread:  the getters anywhere; everything ending in RT, and the protected bodies, on the render thread.
+// depth-stencil buffer, upload and read-back. MKSubBitmap calls it in tasks, MKSubBitmapRT directly.
+// Owner:   the strip owns its GPU objects. Each flavour deletes them in its own destructor.
+// Thread:  the getters on any thread. Functions ending in RT and the protected ones on the render thread.
 #pragma once
 
 #include "moka/base/Export.h"
@@ -33,11 +32,11 @@ public:
     int Ref() override { return RefCount::Ref(); }
     int Unref() override { return RefCount::Unref(); }
 
-    // From the strip's own rectangle; the depth range is -32767 ... 32767. Row `top` maps to -1, which keeps
-    // texture row 0 at the first row of the frame buffer.
+    // Maps the strip's rectangle to clip space; the depth range is -32767 ... 32767. Row `top` maps to -1, so
+    // texture row 0 is the first row of the frame buffer.
     Matrix4<float> GetProjectionMatrix() override { return mProjection; }
 
-    // False also when the renderer refused it.
+    // False if there is none, or if the renderer could not create it.
     bool HasFrameBufferRT() const;
     void CreateFrameBufferRT(bool release) override;
     void ReleaseFrameBufferRT(bool release) override;
@@ -57,36 +56,37 @@ public:
 protected:
     MKSubBitmapBase(IGLMsgQueue* queue, int index, Rect const& rect);
 
-    // The first texture wins; later calls, and a null model, do nothing.
+    // Create the texture, from pixels or as another view of model. If the strip has a texture, or model is
+    // null, they do nothing.
     void CreateTexture(int x, int y, int rowLength, void const* pixels, bool textureFlag);
     void CreateTexture(ITextureObject* model);
 
     void Upload(void const* pixels, int stride);
     void Upload(Rect const& r, void const* pixels, int stride);
 
-    // 0 for what is not on the strip.
+    // Returns 0 for a pixel outside the strip.
     unsigned int ReadPixel(Point const& p);
     // Fills this strip's part of a destination laid out for the whole of r.
     void ReadBlock(Rect const& r, void* destination);
 
-    // Draws this texture into another strip of the same size; nothing without a frame buffer there, since
-    // what is current would then be somebody else's.
+    // Draws this texture into another strip of the same size. Does nothing if that strip has no frame buffer,
+    // because the draw would go to the current one.
     void CopyTextureTo(MKSubBitmapBase* target);
 
     IGLMsgQueue* const mMsgQueue; // not owned
     int const mIndex;
     Rect const mRect;
-    Matrix4<float> const mProjection; // asked for by every draw
-    // Owned, and changed on the render thread alone. Atomic, and so no smart pointers, because caller threads
-    // read them, and may see them a moment late.
+    Matrix4<float> const mProjection; // stored, because every draw needs it
+    // Owned, and written by the render thread only. Atomic pointers instead of smart pointers, because caller
+    // threads read them.
     std::atomic<ITextureObject*> mTexture{nullptr};
     std::atomic<MKFrameBuffer*> mFrameBuffer{nullptr};
 
-    // Present from the first request to the last detach, and never without a frame buffer: the frame buffer's
-    // last release deletes it but leaves the count, so that requests still open stay counted. While they are,
-    // a new frame buffer gets none. // Compat: depth-stencil-count
+    // Exists from the first attach to the last detach, and only together with a frame buffer. The last
+    // release of the frame buffer deletes it but does not reset the count of attach requests. While that
+    // count is not 0, a new frame buffer gets no depth-stencil buffer. // Compat: depth-stencil-count
     std::unique_ptr<MKDepthStencilBuffer> mDepthStencil;
-    int mDepthStencilCount = 0; // requests still open
+    int mDepthStencilCount = 0; // attach requests minus detach requests
 
 private:
     void AttachDepthStencil();

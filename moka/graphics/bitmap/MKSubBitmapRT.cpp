@@ -53,7 +53,7 @@ IMKSubBitmap* MKSubBitmapRT::Clone() {
     clone->CreateFrameBuffer();
     CopyTextureTo(clone);
     if (ITextureObject* const texture = mTexture) clone->SetTag(texture->GetLabel());
-    // As in the caller-side strip: the clone keeps its frame buffer only when this strip has none.
+    // As in MKSubBitmap::Clone, the clone keeps its frame buffer only if this strip has none.
     if (mFrameBuffer) clone->ReleaseFrameBuffer();
     return clone;
 }

@@ -1,6 +1,6 @@
-// MKSubBitmapRT: a strip for code that already runs on the render thread: everything happens at once, nothing
-// is posted, no reference is taken. Callbacks run before the call returns.
-// Thread:  render thread only, its destruction included.
+// MKSubBitmapRT: a strip for code that runs on the render thread: operations execute at once, without tasks
+// and without references. Callbacks run before the call returns.
+// Thread:  render thread only, including destruction.
 #pragma once
 
 #include "moka/graphics/bitmap/MKSubBitmapBase.h"
@@ -9,11 +9,12 @@ namespace Moka {
 
 class MOKA_API MKSubBitmapRT : public MKSubBitmapBase {
 public:
-    // A texture over the strip's rows of pixels, an image `width` pixels wide; null for a transparent one.
+    // Creates the texture from the strip's rows of pixels, an image `width` pixels wide. If pixels is null,
+    // the texture is transparent.
     MKSubBitmapRT(IGLMsgQueue* queue, int index, Rect const& rect, int width, int height, void const* pixels,
                   bool textureFlag);
 
-    // A texture over model's storage; none when model is null.
+    // Creates a texture that shares model's storage, or none if model is null.
     MKSubBitmapRT(IGLMsgQueue* queue, int index, Rect const& rect, ITextureObject* model);
 
     ~MKSubBitmapRT() override;
@@ -40,7 +41,7 @@ public:
     void GetPixelAsync(Point const& p, void* userData, PixelCallback callback) override;
     void GetBitmapData(Rect const& r, void* destination) override { ReadBlock(r, destination); }
     void GetBitmapDataAsync(Rect const& r, void* destination, void* userData, DataCallback callback) override;
-    // The texture's label, whole: unlike that of the other flavour it is not cut.
+    // Sets the texture's label. Unlike in MKSubBitmap the tag is not cut.
     void SetTag(char const* tag) override;
     IMKSubBitmap* Clone() override;
 };

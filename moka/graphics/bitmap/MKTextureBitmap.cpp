@@ -74,14 +74,14 @@ void MKTextureBitmap::BuildStrips(Rect const& region, void const* pixels, bool r
     }
 }
 
-// A band whose model is missing keeps its place in the list, empty.
+// If the model is missing, the list gets a null entry at this place.
 void MKTextureBitmap::ShareStrip(int index, IMKSubBitmap* model, bool renderThread) {
     IMKSubBitmap* strip = nullptr;
     if (model && renderThread) {
         strip =
             new (std::nothrow) MKSubBitmapRT(mMsgQueue, index, model->GetBitmapRect(), model->GetTexture());
     } else if (model) {
-        // Keeps this bitmap, and through it the parent, until the strip's texture has been made.
+        // Keeps this bitmap, and so its parent, alive until the strip's texture has been created.
         Ref();
         strip = new (std::nothrow) MKSubBitmap(mMsgQueue, index, model->GetBitmapRect(), model);
         WorkerTask::PostMember(mMsgQueue, static_cast<RefCount*>(this), &RefCount::Unref);
@@ -97,7 +97,7 @@ void MKTextureBitmap::AddStrip(IMKSubBitmap* strip) {
     }
 }
 
-// Posted behind the strips' own tasks, so that every strip has uploaded before the array goes.
+// Posted after the strips' own tasks, so that every strip has uploaded before the array is deleted.
 void MKTextureBitmap::FreePixels(void const* pixels, bool renderThread) {
     if (!pixels) return;
     auto const* const array = static_cast<unsigned char const*>(pixels);
@@ -130,14 +130,14 @@ void MKTextureBitmap::GetBitmapData(Rect const& r, void* destination) {
 
 void MKTextureBitmap::GetBitmapDataAsync(Rect const& r, void* destination, void* userData,
                                          DataCallback callback) {
-    // The callback may drop the last reference while the strips are being walked.
+    // The callback may drop the last reference during this loop.
     auto const self = RefPtr<MKTextureBitmap>::Share(this);
     IMKSubBitmap* last = nullptr;
     ForEachStrip([&](IMKSubBitmap* strip) { last = strip; });
     ForEachStrip([&](IMKSubBitmap* strip) {
         strip->GetBitmapDataAsync(r, destination, userData, strip == last ? callback : nullptr);
     });
-    // Memory ran out for every strip; whoever waits for the callback must not wait for ever.
+    // Memory ran out for every strip. The callback must run nevertheless, because the caller may wait for it.
     if (!last && callback && GetHeight() > 0) {
         Ref();
         WorkerTask::PostMember(mMsgQueue, this, &MKTextureBitmap::CallBackRT, r, destination, userData,
@@ -281,7 +281,7 @@ void MKTextureBitmap::DetachFromCanvasRT(bool release) {
 }
 
 bool MKTextureBitmap::HasFrameBufferRT(int strip) {
-    // Every strip was created here.
+    // The cast is safe: this class created all strips.
     auto* const wanted = static_cast<MKSubBitmapBase*>(GetSubBitmap(strip < 0 ? 0 : strip));
     return wanted && wanted->HasFrameBufferRT();
 }

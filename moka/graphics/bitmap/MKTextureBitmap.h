@@ -1,14 +1,14 @@
-// MKTextureBitmap: an off-screen GPU image cut into horizontal strips no taller than the device allows. It
-// owns no GPU object itself: it keeps the strips and forwards to the first one, or to all of them.
-// Owner:   reference counted; the creator holds the first reference. Posted work holds the strips, not the
-//          bitmap.
-// Thread:  caller-side flavour from any thread (work is posted); render-thread flavour on the render thread
-//          only. The list of strips never changes after construction.
+// MKTextureBitmap: an off-screen GPU image, divided into horizontal strips no taller than the device allows.
+// The strips own the GPU objects; the bitmap forwards calls to the first one, or to all of them.
+// Owner:   reference counted; the creator holds the first reference. Posted tasks hold references on strips,
+//          not on the bitmap.
+// Thread:  caller-side bitmaps on any thread (work is posted); render-thread bitmaps on the render thread
+//          only. The list of strips does not change after construction.
 // Units:   pixels, origin top left, y down; RGBA8, premultiplied.
-// Fails:   silently where the interface has no channel for it; sizes are validated by the factory.
+// Fails:   silently where the interface cannot report it. The factory validates sizes.
 // Cost:    construction uploads once per strip; blocking reads wait for the render thread.
-// What reaches the first strip only (frame buffer, texture, stencil) is for whoever knows that there is but
-// one; canvases walk the strips.
+// The functions for the frame buffer, the texture and the stencil affect the first strip only. They are for
+// callers that know that there is one strip; canvases iterate over the strips.
 #pragma once
 
 #include "moka/graphics/bitmap/IMKBitmapCanvasAttachable.h"
@@ -29,19 +29,20 @@ class MOKA_API MKTextureBitmap : public MKBitmap,
                                  public IMKBitmapReadable,
                                  public IMKBitmapCanvasAttachable {
 public:
-    // From tightly packed pixels (null for a transparent image). With deleteBuffer the bitmap frees them with
-    // array delete, once every strip has uploaded.
+    // Uploads tightly packed pixels; null makes a transparent image. With deleteBuffer the bitmap deletes the
+    // pixels (delete[] of unsigned char) when every strip has uploaded them.
     MKTextureBitmap(IGLMsgQueue* queue, int width, int height, void const* pixels, bool deleteBuffer,
                     bool renderThread, bool textureFlag);
 
-    // Only what region covers of such an image; bands that miss it get no strip, but keep their number.
+    // Uploads only the region of such an image. Strips outside the region are not created, but still count in
+    // GetBitmapIndex().
     MKTextureBitmap(IGLMsgQueue* queue, Rect const& region, int width, int height, void const* pixels,
                     bool deleteBuffer, bool renderThread);
 
-    // An empty bitmap of size zero; the texture and the switch are not looked at.
+    // Creates an empty bitmap of size zero. texture and renderThread are ignored.
     MKTextureBitmap(IGLMsgQueue* queue, TextureObject const* texture, bool renderThread);
 
-    // Over the textures of another bitmap's strips.
+    // Shares the textures of another bitmap's strips.
     MKTextureBitmap(IGLMsgQueue* queue, IMKTextureBitmap* source, int width, int height, bool renderThread);
 
     ~MKTextureBitmap() override;
@@ -105,12 +106,12 @@ private:
     void FreePixels(void const* pixels, bool renderThread);
     void CallBackRT(Rect const& r, void* destination, void* userData, DataCallback callback);
 
-    // A strip that memory ran out for is a null entry; every walk skips it.
+    // Call action for each strip, or for the first. They skip null entries, for which memory ran out.
     template <class Action>
     void ForEachStrip(Action const& action);
     template <class Action>
     void ForFirstStrip(Action const& action);
-    // Takes the strip's first reference over. When memory runs out the strip is dropped.
+    // Takes ownership of the strip's first reference. If memory runs out, the strip is deleted.
     void AddStrip(IMKSubBitmap* strip);
     IMKSubBitmap* FindStrip(Point const& p);
 

@@ -1,5 +1,6 @@
-/// TextureFilter.h: which filter a bitmap is sampled with.
-/// Thread: the render thread, or another one once what was requested of the bitmap is done, as after a read-back.
+/// TextureFilter.h: reads the filter that a bitmap is sampled with.
+/// Thread: the render thread, or another thread after all requests for the bitmap are done, as after a
+///         read-back.
 #pragma once
 
 #include "moka/graphics/bitmap/IMKBitmap.h"
@@ -9,8 +10,8 @@
 
 namespace Moka {
 
-/// The filter for drawing smaller, which SetTextureFilter sets: that of the first strip, since all strips have the
-/// same. Without a texture the default one.
+/// The minification filter of the first strip; SetTextureFilter sets all strips alike. Without a texture, the
+/// default filter.
 inline TextureParamFilteringValue GetTextureFilter(IMKBitmap& bitmap) {
     IMKTextureBitmap* const strips = bitmap.GetTextureBitmap();
     IMKSubBitmap* const first = strips ? strips->GetSubBitmap(0) : nullptr;

@@ -24,14 +24,14 @@ int CanvasState::Save(IMKCanvasBase::SaveFlag flag) {
     try {
         mLevels.push_back(level);
     } catch (std::bad_alloc const&) {
-        // No memory, no level.
+        // If memory runs out, there is no new level.
     }
     return index;
 }
 
 bool CanvasState::Restore(int level) {
     std::size_t const index = level < 0 ? mLevels.size() - 1 : static_cast<std::size_t>(level);
-    if (index >= mLevels.size()) return false; // also the last one of none
+    if (index >= mLevels.size()) return false; // also for a negative level without levels
     matrix = mLevels[index].matrix;
     clipCount = mLevels[index].clipCount;
     mLevels.resize(index);
@@ -88,7 +88,7 @@ template <class Interface, class Impl, bool kPosts>
 void CanvasFrontEnd<Interface, Impl, kPosts>::SetClipRect(int x, int y, int width, int height, ClipOp op) {
     detail::Request<kPosts>(mMsgQueue, mImpl, &Impl::AddClipRectRT,
                             ClipInfo{x, y, width, height, op, mState.matrix});
-    ++mState.clipCount; // also when the queue refused
+    ++mState.clipCount; // even if the queue refused
 }
 
 template class CanvasFrontEnd<IMKCanvas, MKCanvasImpl, true>;

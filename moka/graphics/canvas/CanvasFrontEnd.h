@@ -1,12 +1,11 @@
-// CanvasFrontEnd: the caller's side of every canvas: clearing, the matrix, clips, the save stack, the
-// tag. DrawingCanvas (MKCanvas.h) and PenCanvas (MKPenCanvas.h) add their operations to it. kPosts tells
-// their two flavours apart: true posts each request to the render thread, false calls the render side at
-// once.
-// Owner:  holds the render side, which dies on the render thread.
-// Thread: one at a time; not posting, the render thread.
-// Fails:  without a render side (memory ran out, or the target does not suit) the local state works on, and
-//         every request is dropped. Requests that the queue refuses are dropped; references taken for them
-//         stay.
+// CanvasFrontEnd: the caller's side of every canvas: clearing, the matrix, clips, the save stack and the tag.
+// DrawingCanvas (MKCanvas.h) and PenCanvas (MKPenCanvas.h) add their operations. If kPosts is true, each
+// request is posted to the render thread; otherwise it calls the render side at once.
+// Owner:  owns the render side, which is deleted on the render thread.
+// Thread: one thread at a time; if kPosts is false, the render thread.
+// Fails:  if there is no render side (memory ran out, or the target is unsuitable), the local state still
+//         works, and requests are dropped. Requests that the queue refuses are dropped as well; references
+//         taken for them are kept.
 #pragma once
 
 #include "moka/base/Export.h"
@@ -18,18 +17,19 @@
 
 namespace Moka {
 
-// Matrix, clip count, saved levels of both, and the tag. A value.
+// The matrix, the clip count, the saved levels of both, and the tag.
 class MOKA_API CanvasState {
 public:
     Matrix3<float> matrix;
-    int clipCount = 0; // clips requested, whether or not the queue took them
+    int clipCount = 0; // the number of requested clips, including those that the queue refused
     Tag tag;
 
-    // Returns the index of the new level. A part that the flag leaves out gets its value in the level below,
-    // or the identity or 0 without one, so that restoring resets it. When memory runs out there is no new
-    // level, and restoring to the index does nothing. // Compat: save-one-part
+    // Returns the index of the new level. The value that the flag leaves out is saved as it is in the level
+    // below, or as the identity or 0 if there is none, so that restoring resets it. If memory runs out there
+    // is no new level, and restoring to the index does nothing. // Compat: save-one-part
     int Save(IMKCanvasBase::SaveFlag flag);
-    // False, and nothing changes, for a level that does not exist. A negative one is the last.
+    // Restores a level and removes it and those above. A negative level means the last one. Returns false and
+    // changes nothing if the level does not exist.
     bool Restore(int level);
 
 private:
@@ -80,7 +80,7 @@ public:
     int Unref() override { return RefCount::Unref(); }
 
 protected:
-    // A null bitmap makes no render side.
+    // With a null bitmap there is no render side.
     CanvasFrontEnd(IGLMsgQueue* queue, IMKBitmap* bitmap);
 
     IGLMsgQueue* const mMsgQueue; // not owned

@@ -1,4 +1,4 @@
-// CanvasRequest.h: how a canvas front end reaches its render side.
+// CanvasRequest.h: the calls from a canvas front end to its render side.
 #pragma once
 
 #include "moka/graphics/task/WorkerTask.h"
@@ -7,9 +7,9 @@
 
 namespace Moka::detail {
 
-// Calls impl->function(values...): posted as a task with copies of the values, or at once with the values
-// themselves. False when it will never run (no impl, or the queue refused): then the caller still owns the
-// values' objects.
+// Calls impl->function(values...), in a posted task with copies of the values, or at once. Returns false if
+// the call will never run (impl is null, or the queue refused it). The caller then still owns the objects
+// that the values point to.
 template <bool kPosts, class Impl, class Function, class... Values>
 bool Request(IGLMsgQueue* queue, Impl* impl, Function function, Values&&... values) {
     if (!impl) return false;

@@ -1,5 +1,5 @@
-// ClipInfo: one clip rectangle, as it was set.
-// Units:  those of the matrix's source, the canvas's matrix at that moment.
+// ClipInfo: one clip rectangle, with its operation and the canvas's matrix when it was set.
+// Units:  pixels before the matrix.
 #pragma once
 
 #include "moka/graphics/canvas/IMKCanvasBase.h"

@@ -15,10 +15,10 @@ class IMKBitmap;
 
 class IMKCanvasBase {
 public:
-    /// Other numbers are allowed: Save then saves neither part. A ClipOp without a name combines nothing.
+    /// The values that Save saves. With another number it saves neither of them.
     enum SaveFlag : int { SaveAll = 0, SaveMatrix = 1, SaveClip = 2 };
 
-    /// How a clip rectangle R changes the allowed area A.
+    /// How a clip rectangle R changes the allowed area A. Another number does not change it.
     enum ClipOp : int {
         Intersect = 0,         ///< A and R
         Replace = 1,           ///< R
@@ -30,21 +30,26 @@ public:
 
     virtual ~IMKCanvasBase() = default;
 
-    /// Within the clip; a colour is 0xAARRGGBB or components 0 ... 1.
+    /// Fill the clipped area with a colour, 0xAARRGGBB or components 0 ... 1, ignoring what was there.
     virtual void Clear(int argb) = 0;
     virtual void Clear(float r, float g, float b, float a) = 0;
-    /// The whole target.
+    /// Fill the whole target with a colour, regardless of the clip.
     virtual void ClearAll(int argb) = 0;
     virtual void ClearAll(float r, float g, float b, float a) = 0;
 
-    /// Save returns a level. Restore(-1) restores the last level; unknown levels are ignored.
+    /// Saves the matrix, the clip, or both, and returns the index of the new level. The first one is 0.
     virtual int Save(SaveFlag flag) = 0;
+    /// Restores matrix and clip of a level, and removes it and all levels above. -1 means the last level.
+    /// Unknown levels are ignored.
     virtual void Restore(int level) = 0;
 
-    /// In the coordinates of the current matrix.
+    /// Adds a clip rectangle, in the coordinates of the current matrix. Later changes of the matrix do not
+    /// affect it.
     virtual void SetClipRect(int x, int y, int width, int height, ClipOp op) = 0;
 
-    /// Pre acts on points before the current matrix, post after it.
+    /// The current matrix, which maps coordinates to pixels of the target. A "pre" function applies its
+    /// transformation to points before the current matrix, a "post" function after it. Rotations are about
+    /// (px, py), or else the origin.
     virtual void SetMatrix(Matrix3<float> const& matrix) = 0;
     virtual Matrix3<float> GetMatrix() = 0;
     virtual void PreConcat(Matrix3<float> const& matrix) = 0;
@@ -58,14 +63,14 @@ public:
     virtual void PreTranslate(float tx, float ty) = 0;
     virtual void PostTranslate(float tx, float ty) = 0;
 
-    /// A label for logs; the first 126 bytes are kept, null is ignored.
+    /// A label for logs. The first 126 bytes are kept; null is ignored.
     virtual void SetTag(char const* tag) = 0;
     virtual char const* GetTag() = 0;
-    /// The queue and the target; may be null. No new reference.
+    /// The queue and the target bitmap; both may be null. The caller gets no reference.
     virtual IGLMsgQueue* GetMsgQueue() = 0;
     virtual IMKBitmap* GetBitmap() = 0;
 
-    /// Takes or drops a reference; the count afterwards. The last Unref deletes the canvas.
+    /// Take or drop a reference, and return the count afterwards. The last Unref deletes the canvas.
     virtual int Ref() = 0;
     virtual int Unref() = 0;
 };

@@ -1,5 +1,5 @@
-/// IMKPenCanvas: a canvas without drawing operations, for external GL code that draws onto a texture bitmap
-/// itself: it gives that code the matrix to draw with and the clip around its drawing.
+/// IMKPenCanvas: a canvas without drawing operations, for external GL code that draws into a texture bitmap.
+/// It provides the matrix for that code and applies the clip around its draws.
 ///
 ///     canvas->EnableClipRT(0);                             on the render thread
 ///     bitmap->GetBitmapWritable()->ActivateFrameBufferRT(false);
@@ -21,12 +21,13 @@ class IMKPenCanvas : public IMKCanvasBase {
 public:
     /// The current matrix.
     virtual Matrix3<float> GetModelMatrix() = 0;
-    /// From the current matrix's pixels to clip space.
+    /// The matrix from coordinates before the current matrix to clip space.
     virtual Matrix4<float> GetCanvasMatrix() = 0;
 
-    /// Between the two, external code may call GL: all earlier requests have been drawn, colour writes are
-    /// on, and the clip is set. The bitmap is one frame buffer; the index is ignored.
+    /// Submits all earlier requests, enables colour writes and sets the clip. External code may call GL from
+    /// here until DisableClipRT. The bitmap counts as one frame buffer; the index is ignored.
     virtual void EnableClipRT(int frameBuffer) = 0;
+    /// Removes the clip. The renderer assumes that external GL has changed all state.
     virtual void DisableClipRT() = 0;
 };
 

@@ -17,7 +17,7 @@ MKPaint const& PaintOrDefault(MKPaint const* paint) {
     return paint ? *paint : unset;
 }
 
-// Width and height stand where right and bottom belong, so this is not the bitmap's own rectangle unless it lies at
+// Uses width and height as right and bottom, so this equals the bitmap's rectangle only if the bitmap lies at
 // the origin.
 RectF WholeOf(IMKBitmap* bitmap) {
     return RectF(Rect(bitmap->GetX(), bitmap->GetY(), bitmap->GetWidth(), bitmap->GetHeight()));
@@ -44,7 +44,7 @@ bool DrawingCanvas<kPosts>::RequestDraw(MKPaint const* paint, Function function,
 template <bool kPosts>
 void DrawingCanvas<kPosts>::Draw(IMKCustomDrawable* drawable, MKPaint const* paint) {
     if (!drawable || !this->mImpl) return;
-    drawable->Ref(); // the request's
+    drawable->Ref(); // for the request
     // Copies, because the drawable may change the canvas and the paint while it draws.
     detail::Request<kPosts>(this->mMsgQueue, this->mImpl, &MKCanvasImpl::DrawRT, drawable, this->GetMatrix(),
                             MKPaint(PaintOrDefault(paint)));
@@ -72,7 +72,7 @@ void DrawingCanvas<kPosts>::DrawSimpleLine(PointF const& from, PointF const& to,
 
 template <bool kPosts>
 void DrawingCanvas<kPosts>::DrawSimpleLines(std::vector<PointF> const& points, MKPaint const* paint) {
-    // The render side deletes the copy, also when it throws.
+    // The render side deletes the copy, even if it throws.
     std::vector<PointF>* const copy = detail::CopyVector(points).release();
     if (!copy) return;
     if (!RequestDraw(paint, &MKCanvasImpl::DrawSimpleLinesRT, copy)) delete copy;
@@ -155,7 +155,7 @@ void DrawingCanvas<kPosts>::RequestBitmaps(IMKBitmap* bitmap, RectF const& src,
                                            std::unique_ptr<std::vector<RectF>> dsts, MKPaint const* paint) {
     if (!dsts) return;
     bitmap->Ref(); // the request's
-    // The render side deletes the rectangles, also when it throws.
+    // The render side deletes the rectangles, even if it throws.
     std::vector<RectF>* const given = dsts.release();
     if (!RequestDraw(paint, &MKCanvasImpl::DrawBitmapsRT, bitmap, src, given)) delete given;
 }

@@ -1,6 +1,6 @@
 // MKCanvas: a canvas for any thread. Each request is posted to the render thread with copies of everything it
 // needs. MKGraphicsFactory::CreateCanvas creates it. MKCanvasRT is the flavour for the render thread.
-// Owner:  as IMKCanvas. Posted requests are drawn, also when the canvas is gone.
+// Owner:  as IMKCanvas. Posted requests are drawn even if the canvas is deleted first.
 // Thread: any, one at a time.
 // Cost:   each call posts one task. Only calls that take a vector also copy it.
 // Fails:  requests that the queue refuses are dropped. References that a request took on a bitmap or a
@@ -49,23 +49,23 @@ protected:
     DrawingCanvas(IGLMsgQueue* queue, IMKBitmap* bitmap);
 
 private:
-    // A function of the render side, with the current matrix and the paint behind the values.
+    // Requests a function of the render side. Appends the current matrix and the paint to the values.
     template <class Function, class... Values>
     bool RequestDraw(MKPaint const* paint, Function function, Values&&... values);
 
     bool CanDraw(IMKBitmap* bitmap) const;
-    // Takes a reference on the bitmap, and over the rectangles.
+    // Takes a reference on the bitmap, and ownership of the rectangles.
     void RequestBitmaps(IMKBitmap* bitmap, RectF const& src, std::unique_ptr<std::vector<RectF>> dsts,
                         MKPaint const* paint);
 };
 
-// Exported here, because MKCanvasImpl, which they are instantiated for, stays hidden.
+// Exported here, because their template argument MKCanvasImpl is not exported.
 extern template class MOKA_API CanvasFrontEnd<IMKCanvas, MKCanvasImpl, true>;
 extern template class MOKA_API DrawingCanvas<true>;
 
 class MOKA_API MKCanvas final : public DrawingCanvas<true> {
 public:
-    // Neither is null.
+    // Neither argument may be null.
     MKCanvas(IGLMsgQueue* queue, IMKBitmap* bitmap);
     ~MKCanvas() override;
 };

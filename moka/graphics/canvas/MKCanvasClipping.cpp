@@ -43,23 +43,23 @@ void MKCanvasClipping::AddClipRectRT(ClipInfo const& info) {
     try {
         mClips.push_back(info);
     } catch (std::bad_alloc const&) {
-        return; // as if the queue had refused the request
+        return; // the clip is dropped, as if the queue had refused the request
     }
     mDirty = true;
 }
 
 void MKCanvasClipping::RemoveClipRectRT(int count) {
-    // More entries than were ever set can only come from requests that a queue refused. One empty entry
-    // already hides everything, so a bound on them shows in no picture and keeps a wild number from taking
-    // all memory; a negative one counts as none.
+    // The count exceeds the number of clips only if a queue refused requests. One empty entry already hides
+    // everything. So the bound changes no picture; it prevents a wild number from taking all memory. A
+    // negative count is 0.
     constexpr std::size_t kMostByCount = 1 << 16;
     std::size_t const wanted = static_cast<std::size_t>(std::max(count, 0));
     ClipInfo empty;
-    empty.matrix = Matrix3<float>(0.0f); // not the identity: it maps all to one point
+    empty.matrix = Matrix3<float>(0.0f); // maps everything to one point
     try {
         mClips.resize(std::min(wanted, std::max(mClips.size(), kMostByCount)), empty);
     } catch (std::bad_alloc const&) {
-        return; // only growing needs memory
+        return; // only growing allocates; nothing has changed
     }
     mDirty = true;
 }
@@ -104,7 +104,7 @@ void MKCanvasClipping::EnableStencil() {
         mDirty = false;
     }
     mMode = Mode::Stencil;
-    // Every drawable applies a state without a stencil test just before it draws.
+    // Keeps the stencil test on, although every drawable applies a state without one before it draws.
     RendererFactory::SetStencilClip(true);
 }
 
@@ -141,7 +141,7 @@ IMKBitmapWritable* MKCanvasClipping::FindWritable(int frameBuffer) const {
 }
 
 ScissorRect MKCanvasClipping::InFrameBuffer(ScissorRect const& rect, int frameBuffer) const {
-    // A texture bitmap's rows start at the bottom of its frame buffers, also when it has one strip only.
+    // The first row of a strip is the bottom row of its frame buffer.
     if (!mBitmap->GetTextureBitmap()) return rect;
     IMKSubBitmap* const strip = FindStrip(frameBuffer);
     Rect const frame = strip ? strip->GetBitmapRect() : mBitmap->GetBitmapRect();

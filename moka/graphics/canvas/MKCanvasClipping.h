@@ -1,10 +1,10 @@
-// MKCanvasClipping: the clip rectangles of one canvas. Around each draw it switches the GPU to where only the
-// clipped area is written: through the scissor test where a rectangle will do, else through the stencil.
-// Owner:  the render-side canvas.
+// MKCanvasClipping: the clip rectangles of one canvas. It applies them around each draw: by the scissor test
+// if the allowed area is one rectangle, else by the stencil test.
+// Owner:  the render side of the canvas.
 // Thread: render thread.
-// Cost:   nothing without clips, a few state changes with the scissor. The stencil is drawn anew for each
-//         draw, which is slow and announces itself in the log each time.
-// A target that is no texture bitmap has no stencil of ours: clips that need one do not work there.
+// Cost:   nothing without clips, a few state changes with the scissor. A stencil clip is requested again for
+//         each draw, which can be slow and logs a warning each time.
+// Only texture bitmaps have a stencil buffer: clips that need one do not work on other targets.
 #pragma once
 
 #include "moka/base/NonAssignable.h"
@@ -20,18 +20,18 @@ class IMKSubBitmap;
 
 class MKCanvasClipping : NonAssignable {
 public:
-    // The bitmap outlives this. Passes exceptions of the shader's constructor on.
+    // The bitmap must outlive this object. Exceptions of the shader's constructor pass through.
     explicit MKCanvasClipping(IMKBitmap* bitmap);
     virtual ~MKCanvasClipping();
 
     bool HasClips() const { return !mClips.empty(); }
     void AddClipRectRT(ClipInfo const& info);
-    // Keeps the first ones. A count above the current one adds empty clips, which hide everything.
+    // Keeps the first `count` clips. A count above the current one adds empty clips, which hide everything.
     // Compat: removed-clips
     void RemoveClipRectRT(int count);
 
-    // For the draw that follows, into a strip, or with -1 into the target as one frame buffer. Activates it
-    // when there are clips.
+    // Applies the clips for the next draw into a strip; -1 means the target as one frame buffer. Activates
+    // the frame buffer if there are clips.
     void EnableClipRT(int frameBuffer);
     // Undoes the last EnableClipRT; the frame buffer stays active.
     void DisableClipRT();
@@ -44,7 +44,7 @@ private:
     void DisableScissor();
     void DisableStencil();
 
-    // Null for a frame buffer that is not there.
+    // Return null if there is no such frame buffer.
     IMKSubBitmap* FindStrip(int frameBuffer) const;
     IMKBitmapWritable* FindWritable(int frameBuffer) const;
     ScissorRect InFrameBuffer(ScissorRect const& rect, int frameBuffer) const;
@@ -55,11 +55,11 @@ private:
 
     IMKBitmap* const mBitmap; // not owned
     detail::ClipList mClips;
-    bool mDirty = true; // the state in force is not that of the list
+    bool mDirty = true; // mMode and mScissor do not match the list
     Mode mMode = Mode::None;
     bool mSavedScissorEnabled = false;
     ScissorRect mSavedScissor;
-    ScissorRect mScissor; // of the list, in the target
+    ScissorRect mScissor; // the allowed rectangle, in pixels of the target
     int mActiveFrameBuffer = -1;
     std::vector<bool> mStencilAttached; // by strip
     detail::StencilClip mStencil;

@@ -16,7 +16,8 @@
 namespace Moka {
 namespace {
 
-// The drawable, made when there is none yet. Before anything is activated: its constructor may throw.
+// Returns the drawable; creates it at the first call. Call it before activating anything, because the
+// constructor may throw.
 template <class T, class... Arguments>
 T* FindOrMake(std::unique_ptr<T>& drawable, Arguments... arguments) {
     if (!drawable) drawable.reset(new (std::nothrow) T(arguments...));
@@ -53,7 +54,7 @@ bool IsOneFrameBuffer(IMKBitmap* target) {
 }
 
 void LogLineDrawableCreated() {
-    // A fixed text, which log filters look for.
+    // A fixed text, because log filters search for it.
     __android_log_print(ANDROID_LOG_INFO, "mok_log", "%s MKLineDrawable Created",
                         "void Moka::MKCanvasImpl::DrawSimpleLinesRT(vector<Moka::PointF> *, Moka::Matrix3f, "
                         "Moka::MKPaint)");
@@ -73,8 +74,10 @@ MKCanvasImpl::~MKCanvasImpl() {
     mBitmapDrawable.reset();
 }
 
-// Walks the frame buffers that a shape can touch, each ready to be drawn into until the next step:
-//     for (Touched frame(*this, shape, m); frame.Next();) drawable->DrawRT(..., frame.GetProjection(), paint);
+// Iterates over the frame buffers that a shape can touch. Each is active and clipped until the next call of
+// Next():
+//     for (Touched frame(*this, shape, m); frame.Next();) drawable->DrawRT(..., frame.GetProjection(),
+//     paint);
 class MKCanvasImpl::Touched {
 public:
     Touched(MKCanvasImpl& canvas, RectF const& shape, Matrix3<float> const& m)
@@ -117,7 +120,7 @@ void MKCanvasImpl::DrawRT(IMKCustomDrawable* drawable, Matrix3<float> const& m, 
     if (!held) return;
     for (FrameBuffers frame(GetBitmap()); frame.Next();) {
         Drawing const ready(GetClipping(), frame.writable, -1);
-        // A custom drawable gets a paint of its own.
+        // A custom drawable gets its own copy of the paint.
         drawable->DrawRT(frame.writable->GetProjectionMatrix() * FromMatrix3(m), MKPaint(paint));
     }
 }
@@ -151,7 +154,7 @@ void MKCanvasImpl::DrawSimpleLinesRT(std::vector<PointF>* points, Matrix3<float>
     MKLineDrawable* const drawable = FindOrMake(mLineDrawable);
     if (!drawable) return;
     if (isFirst) LogLineDrawableCreated();
-    // The drawable deletes what it is given at every call, so each of several strips gets a copy.
+    // The drawable deletes the vector at every call, so each of several strips gets a copy.
     bool const once = IsOneFrameBuffer(GetBitmap());
     RectF const box = BoxOf(*own);
     for (Touched frame(*this, box, m); frame.Next();) {

@@ -1,12 +1,12 @@
-// MKCanvasImpl: the render side of a canvas. It turns each request into calls of a drawable, one for every
-// frame buffer of the target that the shape can touch, under the clip.
-// It keeps neither matrix nor paint: each request brings its own.
-// Thread: render thread; the constructor, without onRenderThread, on any.
-// Units:  pixels before the matrix, which the GPU applies: positions reach it as they are.
-// Cost:   a drawable is made at the first request that needs it. Strip culling uses
-//         the mapped corners only and ignores stroke width and fringe. // Compat: culling
-// Fails:  silently; a drawable whose making failed is tried again by the next request. Exceptions of a
-//         shader's constructor pass through, after the request has released all that it held.
+// MKCanvasImpl: the render side of a canvas. For each request it calls a drawable once for every frame buffer
+// of the target that the shape can touch, under the clip.
+// It keeps neither matrix nor paint: each request has its own.
+// Thread: render thread. The constructor without onRenderThread may run on any thread.
+// Units:  pixels before the matrix. The GPU applies the matrix.
+// Cost:   a drawable is created at the first request that needs it. Strip culling uses the mapped corners
+//         only and ignores stroke width and fringe. // Compat: culling
+// Fails:  silently. If a drawable could not be created, the next request tries again. Exceptions of a
+//         shader's constructor pass through, after the request has released everything that it held.
 #pragma once
 
 #include "moka/base/Point.h"
@@ -31,37 +31,38 @@ public:
     MKCanvasImpl(IGLMsgQueue* queue, IMKBitmap* bitmap, bool onRenderThread);
     ~MKCanvasImpl() override;
 
-    // Drops one reference on the drawable. Draws onto every frame buffer, each as index -1, so stencil clips
-    // do not cut it on texture bitmaps. // Compat: whole-frame-buffer
+    // Drops one reference on the drawable. Draws into every frame buffer, each with index -1. So stencil
+    // clips have no effect on it on texture bitmaps. // Compat: whole-frame-buffer
     void DrawRT(IMKCustomDrawable* drawable, Matrix3<float> const& m, MKPaint const& paint);
 
     void DrawLineRT(PointF const& a, PointF const& b, Matrix3<float> const& m, MKPaint const& paint);
     void DrawSimpleLineRT(PointF const& a, PointF const& b, Matrix3<float> const& m, MKPaint const& paint);
-    // Takes the vector over.
+    // Takes ownership of the vector.
     void DrawSimpleLinesRT(std::vector<PointF>* points, Matrix3<float> const& m, MKPaint const& paint);
     void DrawRectRT(RectF const& r, Matrix3<float> const& m, MKPaint const& paint);
     void DrawRoundRectRT(RectF const& r, float rx, float ry, Matrix3<float> const& m, MKPaint const& paint);
     void DrawCircleRT(PointF const& c, float radius, Matrix3<float> const& m, MKPaint const& paint);
 
-    // These two drop one reference on src. Of a paint that does not tile, each strip of src is drawn apart,
+    // These two drop one reference on src. If the paint does not tile, each strip of src is drawn separately,
     // clamped at its edges.
     void DrawBitmapRT(IMKBitmap* src, RectF const& srcRect, RectF const& dstRect, Matrix3<float> const& m,
                       MKPaint const& paint);
-    // Deletes the vector. Uses the first strips only, as index -1. // Compat: first-strips
+    // Deletes the vector. Uses the first strips only, with index -1. // Compat: first-strips
     void DrawBitmapsRT(IMKBitmap* src, RectF const& srcRect, std::vector<RectF>* dstRects,
                        Matrix3<float> const& m, MKPaint const& paint);
 
 private:
     class Touched;
 
-    // The product of the matrices of the last draw: neighbours mostly share both.
+    // The matrices of the last draw and their product. Consecutive draws mostly use the same two matrices.
     struct Projection {
         Matrix4<float> target;
         Matrix3<float> model;
         Matrix4<float> product;
     };
 
-    // From pixels before the model matrix to the target. Valid until the next call.
+    // Returns the matrix from model coordinates (pixels) to the target's clip coordinates. The reference is
+    // valid until the next call.
     Matrix4<float> const& Project(IMKBitmapWritable& target, Matrix3<float> const& model);
 
     void DrawWhole(IMKBitmap* src, RectF const& srcRect, RectF const& dstRect, Matrix3<float> const& m,

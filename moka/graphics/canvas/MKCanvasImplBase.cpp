@@ -76,7 +76,8 @@ void MKCanvasImplBase::createClippingRT() {
     try {
         mClipping.reset(new (std::nothrow) MKCanvasClipping(GetBitmap()));
     } catch (std::bad_alloc const&) {
-        // Its list of strips did not fit: a canvas without clipping, as when it did not fit itself.
+        // Memory ran out inside the constructor. The canvas has no clipping, as if allocating the object had
+        // failed.
     }
 }
 
@@ -92,7 +93,7 @@ void MKCanvasImplBase::ClearRT(Vector4<float> const& rgba) {
         if (mClipping) mClipping->EnableClipRT(frame.index);
         frame.writable->ClearColorRT(rgba.x, rgba.y, rgba.z, rgba.w);
         if (mClipping) mClipping->DisableClipRT();
-        // Clearing activates nothing, but the clip has.
+        // Clearing does not activate the frame buffer, but the clip did.
         if (clipped) frame.writable->DeactivateFrameBufferRT(false, DiscardFramebufferNone);
     }
 }
@@ -106,7 +107,7 @@ void MKCanvasImplBase::ClearAllRT(Vector4<float> const& rgba) {
     for (FrameBuffers frame(GetBitmap()); frame.Next();)
         frame.writable->ClearColorRT(rgba.x, rgba.y, rgba.z, rgba.w);
     if (!scissored) return;
-    // The rectangle is restored, the test stays off for the rest of the frame.
+    // Restores the rectangle; the test stays off.
     rasterizer->SetScissorEnabled(false);
     rasterizer->SetScissorRect(saved);
 }

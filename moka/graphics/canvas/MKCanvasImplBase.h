@@ -1,9 +1,10 @@
 // MKCanvasImplBase: the common base of the render sides of canvas and pen canvas: the target, its clip, and
 // clearing.
-// Owner:  a front end, which has it deleted on the render thread. Holds two references on the target, its own
-//         and that of the attachment.
-// Thread: render thread; the constructor, without onRenderThread, on any.
-// Fails:  silently. Without a clip, for which memory ran out or its task was refused, everything is drawn.
+// Owner:  a front end, which posts its deletion to the render thread. Holds two references on the target: its
+//         own and that of the attachment.
+// Thread: render thread. The constructor without onRenderThread may run on any thread.
+// Fails:  silently. If the clipping could not be created, because memory ran out or its task was refused,
+//         draws are not clipped.
 #pragma once
 
 #include "moka/base/NonAssignable.h"
@@ -28,15 +29,16 @@ public:
     IMKBitmap* GetBitmap() const { return mTarget.bitmap; }
 
     void createClippingRT();
-    // Within the clip.
+    // Clears within the clip.
     void ClearRT(Vector4<float> const& rgba);
-    // Everything, whatever clip and scissor say; the scissor rectangle is as before, its test off.
+    // Clears everything, regardless of clip and scissor. Keeps the scissor rectangle and switches the scissor
+    // test off.
     void ClearAllRT(Vector4<float> const& rgba);
     void AddClipRectRT(ClipInfo const& info);
     void RemoveClipRectRT(int count);
 
 protected:
-    // Walks the frame buffers that the target consists of, those that exist:
+    // Iterates over the existing frame buffers of the target:
     //     for (FrameBuffers frame(bitmap); frame.Next();) frame.writable->...
     class FrameBuffers {
     public:
@@ -52,10 +54,10 @@ protected:
         IMKTextureBitmap* const mStrips; // null for a target that is one frame buffer
         int const mStripCount;
         IMKBitmapCanvasAttachable* const mAttachable;
-        bool mIsDone = false; // with the one frame buffer
+        bool mIsDone = false; // Next() has returned the only frame buffer
     };
 
-    // A frame buffer ready to be drawn into under the clip, for the scope.
+    // Activates a frame buffer and its clip for a scope.
     class Drawing {
     public:
         Drawing(MKCanvasClipping* clipping, IMKBitmapWritable* writable, int index);
@@ -73,8 +75,8 @@ protected:
     MKCanvasClipping* GetClipping() const { return mClipping.get(); }
     void DeleteClipping() { mClipping.reset(); }
 
-    // Of a strip, or with -1 of the target as one. Draws without one are dropped: they would reach the
-    // frame buffer that the host has bound.
+    // True if the strip has a frame buffer; -1 asks for the target as one. Draws without a frame buffer are
+    // dropped, because they would go to the one that the host has bound.
     bool HasFrameBuffer(int index) const;
 
 private:

@@ -1,7 +1,7 @@
-// MKCanvasRT: a canvas for code that already runs on the render thread: each request is drawn before the call
-// returns. MKGraphicsFactory::CreateCanvas creates it. Its operations stand in MKCanvas.h.
+// MKCanvasRT: a canvas for code that runs on the render thread: each request is executed before the call
+// returns. MKGraphicsFactory::CreateCanvas creates it. MKCanvas.h declares its operations.
 // Owner:  as IMKCanvas.
-// Thread: render thread only, its destruction included.
+// Thread: render thread only, including destruction.
 // Fails:  as MKCanvasImpl; exceptions of a shader's constructor reach the caller.
 #pragma once
 
@@ -14,7 +14,7 @@ extern template class MOKA_API DrawingCanvas<false>;
 
 class MOKA_API MKCanvasRT final : public DrawingCanvas<false> {
 public:
-    // The bitmap is not null.
+    // The bitmap must not be null.
     MKCanvasRT(IGLMsgQueue* queue, IMKBitmap* bitmap);
     ~MKCanvasRT() override;
 };

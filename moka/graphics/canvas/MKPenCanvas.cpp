@@ -8,7 +8,7 @@
 namespace Moka {
 namespace {
 
-// The bitmap, or null when a pen canvas cannot draw onto it.
+// Returns the bitmap if it is a texture bitmap. Otherwise logs an error and returns null.
 IMKBitmap* PenTarget(IMKBitmap* bitmap, char const* className) {
     if (bitmap->GetTextureBitmap()) return bitmap;
     __android_log_print(ANDROID_LOG_ERROR, "mok_log", "%s, PenCanvas can't set ScreenBitmap", className);

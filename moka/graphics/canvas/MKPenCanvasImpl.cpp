@@ -16,7 +16,7 @@ Matrix4<float> MKPenCanvasImpl::GetCanvasMatrix() const {
     return writable ? writable->GetProjectionMatrix() : Matrix4<float>();
 }
 
-// External GL may have left them off, and a commit keeps states that nobody has set.
+// External GL may have switched colour writes off, and a commit does not set unknown states.
 void MKPenCanvasImpl::SwitchColorWritesOn() {
     if (!mColorWrites) {
         BlendStateDescriptor descriptor(false);
@@ -29,7 +29,7 @@ void MKPenCanvasImpl::SwitchColorWritesOn() {
 void MKPenCanvasImpl::EnableClipRT(int) {
     Trace::NameTask("EnableClipRT");
     if (!HasFrameBuffer(-1)) {
-        // The clip of a stencil would be drawn into somebody else's.
+        // Without a frame buffer a stencil clip would be drawn into that of the host.
         __android_log_print(ANDROID_LOG_ERROR, "mok_log",
                             "MKPenCanvasImpl::EnableClipRT: the bitmap (\"%s\") has no frame buffer; what is "
                             "drawn now goes to the one that the host has bound, so draw nothing",
@@ -38,7 +38,7 @@ void MKPenCanvasImpl::EnableClipRT(int) {
         clipping->EnableClipRT(-1);
     }
     SwitchColorWritesOn();
-    RendererFactory::Commit(); // what is drawn next is not drawn through the renderer
+    RendererFactory::Commit(); // external GL draws next
 }
 
 void MKPenCanvasImpl::DisableClipRT() {

@@ -1,5 +1,6 @@
-// MKPenCanvasImpl: the render side of a pen canvas: the clip around external drawing, without drawables.
-// Thread: render thread; the constructor, without onRenderThread, and GetCanvasMatrix on any.
+// MKPenCanvasImpl: the render side of a pen canvas. It applies the clip around external draws and has no
+// drawables.
+// Thread: render thread. The constructor without onRenderThread, and GetCanvasMatrix, may run on any thread.
 #pragma once
 
 #include "moka/graphics/canvas/MKCanvasImplBase.h"
@@ -14,18 +15,18 @@ public:
     MKPenCanvasImpl(IGLMsgQueue* queue, IMKBitmap* bitmap, bool onRenderThread);
     ~MKPenCanvasImpl() override;
 
-    // From the target's pixels to clip space.
+    // The matrix from the target's pixels to clip space.
     Matrix4<float> GetCanvasMatrix() const;
 
-    // Without a frame buffer no clip is made, and an error line says so.
-    // Uses the bitmap as one frame buffer, whatever the index. // Compat: whole-frame-buffer
+    // Without a frame buffer, logs an error and sets no clip.
+    // Uses the bitmap as one frame buffer and ignores the index. // Compat: whole-frame-buffer
     void EnableClipRT(int frameBuffer);
     void DisableClipRT();
 
 private:
     void SwitchColorWritesOn();
 
-    detail::RendererPtr<IBlendStateObject> mColorWrites; // made by the first enable
+    detail::RendererPtr<IBlendStateObject> mColorWrites; // created by the first EnableClipRT
 };
 
 } // namespace Moka

@@ -1,7 +1,7 @@
-// MKPenCanvasRT: a pen canvas for code that already runs on the render thread; nothing is posted.
-// MKGraphicsFactory::CreatePenCanvas creates it. Its operations stand in MKPenCanvas.h.
+// MKPenCanvasRT: a pen canvas for code that runs on the render thread; nothing is posted.
+// MKGraphicsFactory::CreatePenCanvas creates it. MKPenCanvas.h declares its operations.
 // Owner:  as IMKPenCanvas.
-// Thread: render thread only, its destruction included.
+// Thread: render thread only, including destruction.
 // Fails:  as MKPenCanvas.
 #pragma once
 
@@ -14,7 +14,7 @@ extern template class MOKA_API PenCanvas<false>;
 
 class MOKA_API MKPenCanvasRT final : public PenCanvas<false> {
 public:
-    // The bitmap is not null.
+    // The bitmap must not be null.
     MKPenCanvasRT(IGLMsgQueue* queue, IMKBitmap* bitmap);
     ~MKPenCanvasRT() override;
 };

@@ -8,7 +8,7 @@
 namespace Moka::detail {
 namespace {
 
-// Edges are sums of a few whole numbers of 32 bits.
+// 64 bits, because an edge is a sum of several 32-bit integers.
 struct Edges {
     std::int64_t left;
     std::int64_t bottom;
@@ -21,7 +21,7 @@ bool IsReplace(ClipInfo const& clip) { return clip.op == IMKCanvasBase::Replace;
 // Compat: rotation-test
 bool IsUpright(ClipInfo const& clip) { return clip.matrix[3] == 0; }
 
-// No target reaches further; and the distance of two such edges is still an int.
+// Clamps to a range that exceeds every target. The difference of two such edges still fits an int.
 int ToEdge(std::int64_t value) {
     constexpr std::int64_t kFar = std::int64_t{1} << 30;
     return static_cast<int>(std::clamp(value, -kFar, kFar - 1));

@@ -1,4 +1,4 @@
-// SourcePiece.h: one strip's part of a bitmap that is drawn.
+// SourcePiece.h: the part of a drawn bitmap that lies on one strip.
 #pragma once
 
 #include "moka/base/Rect.h"
@@ -10,7 +10,7 @@ struct SourcePiece {
     RectF dst; // the part of the destination that shows src
 };
 
-// The part of src that lies on the strip; false when none does.
+// Sets piece to the part of src that lies on the strip. Returns false if there is none.
 bool CutToStrip(Rect const& strip, RectF const& src, RectF const& dst, SourcePiece& piece);
 
 } // namespace Moka::detail

@@ -11,7 +11,8 @@ namespace {
 
 constexpr int kVertices = 6;
 
-// Two triangles; the third number is the program's coverage, which nobody sees here.
+// Sets two triangles. The third number of a vertex is the coverage, which has no effect because colour is not
+// written.
 void SetRectangle(IGraphicsObject& graphics, float left, float top, float right, float bottom) {
     float const vertices[kVertices * 3] = {left,  top, 0, left, bottom, 0, right, top,    0,
                                            right, top, 0, left, bottom, 0, right, bottom, 0};
@@ -67,14 +68,15 @@ void StencilClip::Draw(ClipList const& clips, IMKBitmapWritable& frameBuffer) {
     mBlend->Apply();
     mDepthStencil->Apply();
     mShader->program->MakeCurrent();
-    // Nobody sees the colour. The same one each time lets the renderer find that nothing has changed.
+    // The colour is not written. Setting the same one each time lets the renderer detect that nothing has
+    // changed.
     mShader->uColor = Vector4<float>(0, 0, 0, 0);
     mShader->uTintColor = Vector4<float>(0, 0, 0, 0);
     mShader->uHasTintColor = 0;
     ClearStencil(frameBuffer, initial);
     DrawClips(clips, frameBuffer);
     AllowWhereOne();
-    // Whoever draws next need not set a blend state of its own.
+    // Switches colour writes on again, for draws that set no blend state.
     BlendStateDescriptor colorOn(false);
     colorOn.SetEnabled(false, true);
     mBlend->SetDescriptor(colorOn);

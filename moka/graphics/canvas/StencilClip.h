@@ -1,7 +1,8 @@
-// StencilClip: draws clip rectangles into the stencil of a frame buffer, so that allowed pixels hold 1.
+// StencilClip: draws clip rectangles into the stencil buffer of a frame buffer, so that allowed pixels hold
+// 1.
 // Thread: render thread.
-// Fails:  if a GPU object could not be created, the stencil is cleared and no clip drawn. The constructor
-//         passes exceptions of its shader on.
+// Fails:  if a GPU object could not be created, clears the stencil and draws no clip. Exceptions of the
+//         shader's constructor pass through.
 #pragma once
 
 #include "moka/graphics/canvas/ScissorClip.h"
@@ -28,8 +29,8 @@ public:
     StencilClip(StencilClip const&) = delete;
     StencilClip& operator=(StencilClip const&) = delete;
 
-    // The frame buffer is active, without a scissor. Afterwards the stencil test passes the pixels that the
-    // clips allow, the stencil is not written any more, and colours are written again.
+    // The frame buffer must be active, with the scissor test off. Afterwards the stencil test passes the
+    // allowed pixels, draws do not write the stencil, and they write colour.
     void Draw(ClipList const& clips, IMKBitmapWritable& frameBuffer);
 
 private:
@@ -43,7 +44,7 @@ private:
     void DrawClips(ClipList const& clips, IMKBitmapWritable& frameBuffer);
     void DrawClip(ClipInfo const& clip, IMKBitmapWritable& frameBuffer);
     void FillClipGeometry(ClipInfo const& clip);
-    // Draws with a reference of its own into the stencil alone.
+    // Draws the area into the stencil only, with this stencil function and operation.
     void Pass(Area const& area, StencilComparison comparison, int reference, StencilOperation operation);
     void AllowWhereOne();
 

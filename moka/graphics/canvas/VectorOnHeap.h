@@ -1,4 +1,4 @@
-// VectorOnHeap.h: vectors whose ownership travels with a request.
+// VectorOnHeap.h: copies vectors for requests, which own the copies.
 #pragma once
 
 #include <memory>
@@ -7,7 +7,7 @@
 
 namespace Moka::detail {
 
-// One element for each of source, converted. Null, not an exception, when memory runs out.
+// Returns a vector with one converted element for each of source. Returns null if memory runs out.
 template <class T, class Source, class Convert>
 std::unique_ptr<std::vector<T>> NewVector(Source const& source, Convert const& convert) noexcept try {
     auto result = std::make_unique<std::vector<T>>();

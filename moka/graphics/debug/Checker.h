@@ -1,17 +1,16 @@
-/// Checker: wraps an object and counts the references that go through it. A use after the last Unref fails
-/// here, and not in freed memory. A debugging aid: code that suspects such a use hands out the checker
-/// instead of the object; the library itself creates none.
+/// Checker: wraps an object and counts the references taken through it. A use after the last Unref throws,
+/// instead of reading freed memory. It is a debugging aid: pass the checker to code that you suspect, in
+/// place of the object. The library itself creates no checkers.
 ///
 ///     MKBitmapChecker     Checker<IMKBitmap>
 ///     MKCanvasChecker     CanvasChecker<IMKCanvas>, over Checker<IMKCanvas>
 ///     MKPenCanvasChecker  CanvasChecker<IMKPenCanvas>, over Checker<IMKPenCanvas>
 ///
-/// Owner:  the creator deletes it. It holds none of the object's references, and stays alive at a count of
-///         zero, to refuse. Its own count starts at one.
-/// Thread: the object's own rules. Counting is exact from any thread, but a use that races with the last
-///         Unref may still get through.
-/// Fails:  with a count of zero every operation leaves the object alone, logs its address and the tag, and
-///         throws std::logic_error.
+/// Owner:  the creator deletes it. It holds no reference on the object. It stays alive when its count is
+///         zero, so that it can report later uses. The count starts at one.
+/// Thread: as for the object. Counting is atomic, but a use that races with the last Unref may still pass.
+/// Fails:  with a count of zero every operation logs the object's address and the tag, throws
+///         std::logic_error, and does not touch the object.
 #pragma once
 
 #include "moka/base/CriticalSection.h"
@@ -28,7 +27,7 @@ class IMKCanvasBase;
 
 namespace detail {
 
-/// Log the line and throw; neither touches the object.
+/// Log an error and throw. They do not touch the object.
 [[noreturn]] MOKA_API void FailReleased(IMKBitmap const* bitmap, char const* tag, int refCount);
 [[noreturn]] MOKA_API void FailReleased(IMKCanvasBase const* canvas, char const* tag, int refCount);
 
@@ -40,7 +39,7 @@ public:
         if (int const count = mRefCount; count <= 0) FailReleased(mWrapped, mTag.Get(), count);
     }
 
-    /// The object gets the whole tag; the checker keeps the first 126 bytes for its own messages.
+    /// Forwards the whole tag; the checker keeps the first 126 bytes for its own messages.
     void SetTag(char const* tag) override {
         checkRefCount();
         mTag.Set(tag);
@@ -50,7 +49,8 @@ public:
     /// Forwards while referenced.
     IGLMsgQueue* GetMsgQueue() override { return Checked().GetMsgQueue(); }
 
-    /// Forwards without the lock: the last reference may delete the object and run other code.
+    /// Change the count, then forward without the lock, because the last Unref may delete the object and run
+    /// other code.
     int Ref() override {
         ChangeCount(1);
         return mWrapped->Ref();
@@ -61,10 +61,10 @@ public:
     }
 
 protected:
-    /// wrapped is not null and not owned.
+    /// wrapped must not be null. The checker does not own it.
     explicit Checker(Interface* wrapped) : mLock(false), mWrapped(wrapped) {}
 
-    /// The way to the object for every operation that only forwards.
+    /// The object, after checking the count.
     Interface& Checked() const {
         checkRefCount();
         return *mWrapped;
@@ -74,14 +74,14 @@ protected:
     char const* GetOwnTag() const { return mTag.Get(); }
 
 private:
-    // The check and the change are one step: of two last Unrefs at once only one passes.
+    // Check and change are one step, so of two simultaneous last Unrefs only one passes.
     void ChangeCount(int by) {
         AutoCriticalSection const lock(mLock);
         checkRefCount();
         mRefCount += by;
     }
 
-    CriticalSection mLock; // held to change the count; it is read without
+    CriticalSection mLock; // held to change the count, not to read it
     Interface* const mWrapped;
     Tag mTag;
     std::atomic<int> mRefCount{1};

@@ -1,6 +1,6 @@
-/// MKBitmapChecker: a bitmap that hands every call on to another one while it is referenced, and throws
+/// MKBitmapChecker: a bitmap that forwards every call to another one while it is referenced, and throws
 /// "Bitmap was already released!!" afterwards. Owner, Thread, Fails: see Checker.h.
-/// The capabilities and clones that it returns are the wrapped bitmap's own, and unchecked.
+/// The capabilities and clones that it returns belong to the wrapped bitmap and are not checked.
 #pragma once
 
 #include "moka/graphics/bitmap/IMKBitmap.h"
@@ -31,7 +31,7 @@ public:
     int GetHeight() const override { return Checked().GetHeight(); }
     Rect GetBitmapRect() override { return Checked().GetBitmapRect(); }
 
-    char const* GetTag() override { return Checked().GetTag(); } ///< a canvas checker answers with its own
+    char const* GetTag() override { return Checked().GetTag(); } ///< the bitmap's own tag
     IMKBitmap* Clone() override { return Checked().Clone(); }
 
     /// Forward while referenced.

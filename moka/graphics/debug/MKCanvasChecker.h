@@ -1,4 +1,4 @@
-/// MKCanvasChecker: a canvas that hands every call on to another one while it is referenced, and throws
+/// MKCanvasChecker: a canvas that forwards every call to another one while it is referenced, and throws
 /// "Canvas was already released!!" afterwards. Owner, Thread, Fails: see Checker.h.
 /// GetMatrix and GetBitmap end the process, as calls to pure virtual functions do.
 // Compat: checker-pure

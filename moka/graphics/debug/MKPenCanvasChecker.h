@@ -1,5 +1,5 @@
-/// MKPenCanvasChecker: a pen canvas that hands every call on to another one while it is referenced, and throws
-/// "Canvas was already released!!" afterwards. Owner, Thread, Fails: see Checker.h.
+/// MKPenCanvasChecker: a pen canvas that forwards every call to another one while it is referenced, and
+/// throws "Canvas was already released!!" afterwards. Owner, Thread, Fails: see Checker.h.
 /// GetMatrix ends the process, as a call to a pure virtual function does; GetBitmap forwards.
 ///
 // Compat: checker-pure

@@ -39,7 +39,7 @@ CustomDrawable<Shader>::CustomDrawable(IGLMsgQueue* queue, PrimitiveType primiti
     WorkerTask::PostMember(queue, this, &CustomDrawable::ConstructRT);
 }
 
-// May run while the constructors of the classes above this one still do, so it calls nothing that is virtual.
+// Calls no virtual function, because it may run before the constructors of derived classes have finished.
 template <class Shader>
 void CustomDrawable<Shader>::ConstructRT() {
     RefPtr<RefCount> const self = RefPtr<RefCount>::Adopt(this);

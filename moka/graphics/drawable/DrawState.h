@@ -1,4 +1,4 @@
-// DrawState: the blend and the depth-stencil state that a drawable draws with, both its own.
+// DrawState: the blend state and the depth-stencil state of a drawable.
 // Thread: render thread, except PostRelease.
 // Fails:  false if the renderer refused a state; drawables check it before they draw.
 #pragma once
@@ -12,20 +12,20 @@ namespace Moka::detail {
 
 class DrawState {
 public:
-    // Blending, and neither a depth nor a stencil test.
+    // Creates a state with blending, without depth and stencil tests.
     DrawState();
 
     explicit operator bool() const { return mBlend && mDepthStencil; }
 
-    // These need a state that is true. A mode is set at each draw; the renderer skips unchanged states.
+    // Sets both states. Requires that the object converts to true. The renderer skips unchanged states.
     void Apply(MKPaint::XFermode mode);
-    // The two halves of it, for those who set more in between.
+    // Set one of the two states each, for drawables that set other state in between.
     void ApplyBlend(MKPaint::XFermode mode);
     void ApplyDepthStencil() { mDepthStencil->Apply(); }
 
-    // The blend state first. Afterwards it is false.
+    // Releases the blend state, then the depth-stencil state. Afterwards the object converts to false.
     void Release();
-    // The same from any thread.
+    // Posts the release. Callable on any thread.
     void PostRelease(IGLMsgQueue* queue);
 
 private:

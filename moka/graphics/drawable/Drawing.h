@@ -1,4 +1,4 @@
-// Drawing.h: the steps that drawing with any of the programs has in common.
+// Drawing.h: steps that all drawables have in common.
 // Thread: render thread.
 #pragma once
 
@@ -11,14 +11,14 @@
 
 namespace Moka::detail {
 
-// Vertices whose attributes have so many floats each.
+// Describes a vertex. Each number is the number of floats of one attribute.
 inline VertexDescriptor FloatVertex(std::initializer_list<int> attributes) {
     VertexDescriptor vertex;
     for (int const floats : attributes) vertex.addAttribute(VertexAttributeType::Float, floats, -1, 0);
     return vertex;
 }
 
-// Null when the renderer refuses.
+// Returns null if the renderer could not create the object.
 inline RendererPtr<IGraphicsObject> CreateGraphics(PrimitiveType primitive, VertexDescriptor const& vertex) {
     return RendererPtr<IGraphicsObject>(RendererFactory::CreateGraphicsObject(1, primitive, &vertex, 0, 0));
 }

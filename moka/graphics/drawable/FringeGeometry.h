@@ -1,7 +1,7 @@
-// FringeGeometry: rectangles as triangles whose vertices carry a coverage, 1 inside and 0 outside. Between
-// the two lies a fringe one unit wide, half of it on either side of the edge, over which the coverage falls.
-// Everything writes into the caller's array and returns the place behind what it wrote.
-// Units: those of the projection's source. Nothing is clamped or sorted: inverted rectangles give inverted
+// FringeGeometry: triangulates rectangles. Each vertex has a coverage, 1 inside and 0 outside. At the edges
+// the coverage falls over a fringe one unit wide, half of it on either side of the edge.
+// The Write functions write to the caller's array and return the position after the last vertex.
+// Units: those before the projection. Nothing is clamped or sorted: inverted rectangles give inverted
 //        triangles.
 #pragma once
 
@@ -12,7 +12,8 @@
 
 namespace Moka::detail {
 
-// As the programs' vertex stages declare them; not initialised, because arrays of them are filled at once.
+// The vertices as the vertex stages declare them. Members are not initialised, because arrays of them are
+// filled next.
 struct CoverageVertex {
     float x;
     float y;
@@ -29,7 +30,7 @@ struct TexturedVertex {
 
 constexpr int kQuadVertices = 6;
 constexpr int kRingVertices = 4 * kQuadVertices;
-// Of an anti-aliased rectangle.
+// The vertices of an anti-aliased rectangle.
 constexpr int kMostFillVertices = kRingVertices + kQuadVertices;
 constexpr int kMostStrokeVertices = 3 * kRingVertices;
 
@@ -39,7 +40,7 @@ struct Outline {
     float coverage;
 };
 
-// In the order of a triangle strip.
+// The corners of a rectangle in the order of a triangle strip.
 template <class Vertex>
 struct Corners {
     Vertex leftTop;
@@ -52,7 +53,7 @@ inline RectF Grown(RectF const& r, float by) {
     return {r.left - by, r.top - by, r.right + by, r.bottom + by};
 }
 
-// The sides in order, and so far outside of them.
+// Sorts the sides and grows the rectangle by reach.
 inline RectF Hull(RectF const& r, float reach) {
     return Grown({std::min(r.left, r.right), std::min(r.top, r.bottom), std::max(r.left, r.right),
                   std::max(r.top, r.bottom)},
@@ -67,7 +68,7 @@ inline Corners<CoverageVertex> CoverageCorners(Outline const& o) {
             {r.right, r.bottom, o.coverage}};
 }
 
-// Each side has its texture coordinate, wherever the outline lies.
+// The texture coordinates are those of the sides, whatever the size of the outline.
 inline Corners<TexturedVertex> TexturedCorners(Outline const& o, RectF const& uv) {
     RectF const& r = o.edges;
     return {{r.left, r.top, o.coverage, uv.left, uv.top},
@@ -76,7 +77,7 @@ inline Corners<TexturedVertex> TexturedCorners(Outline const& o, RectF const& uv
             {r.right, r.bottom, o.coverage, uv.right, uv.bottom}};
 }
 
-// a and d lie opposite each other.
+// Writes two triangles. a and d are opposite corners.
 template <class Vertex>
 Vertex* WriteQuad(Vertex* at, Vertex const& a, Vertex const& b, Vertex const& c, Vertex const& d) {
     *at++ = a;
@@ -93,7 +94,7 @@ Vertex* WriteQuad(Vertex* at, Corners<Vertex> const& c) {
     return WriteQuad(at, c.leftTop, c.leftBottom, c.rightTop, c.rightBottom);
 }
 
-// Four bands with mitred corners: top, bottom, left, right.
+// Writes four bands with mitred corners: top, bottom, left, right.
 template <class Vertex>
 Vertex* WriteRing(Vertex* at, Corners<Vertex> const& outer, Corners<Vertex> const& inner) {
     at = WriteQuad(at, outer.leftTop, inner.leftTop, outer.rightTop, inner.rightTop);
@@ -102,7 +103,7 @@ Vertex* WriteRing(Vertex* at, Corners<Vertex> const& outer, Corners<Vertex> cons
     return WriteQuad(at, inner.rightTop, inner.rightBottom, outer.rightTop, outer.rightBottom);
 }
 
-// cornersOf makes the vertices of an outline.
+// Writes a filled rectangle. cornersOf returns the corners of an outline.
 template <class Vertex, class CornersOf>
 Vertex* WriteFill(Vertex* at, RectF const& rect, bool antiAliased, CornersOf const& cornersOf) {
     if (!antiAliased) return WriteQuad(at, cornersOf(Outline{rect, 1}));
@@ -111,8 +112,8 @@ Vertex* WriteFill(Vertex* at, RectF const& rect, bool antiAliased, CornersOf con
     return WriteQuad(at, inner);
 }
 
-// The bands of an anti-aliased stroke, from the outer fringe to the inner one; writeBand writes what lies
-// between two outlines.
+// Writes the bands of an anti-aliased stroke, from the outer fringe to the inner one. writeBand writes the
+// band between two outlines.
 template <class Vertex, class WriteBand>
 Vertex* WriteStrokeBands(Vertex* at, RectF const& rect, float halfWidth, WriteBand const& writeBand) {
     RectF const outer = Grown(rect, halfWidth);

@@ -1,6 +1,6 @@
-/// IMKCustomDrawable: something that draws itself onto a canvas: IMKCanvas::Draw() hands it over.
+/// IMKCustomDrawable: an object that draws itself. IMKCanvas::Draw() requests the draw.
 /// Owner:  reference counted; each request holds one reference until it has been drawn.
-/// Thread: DrawRT on the render thread, the references from any.
+/// Thread: DrawRT runs on the render thread. Ref and Unref may be called on any thread.
 /// The vtable order is ABI.
 #pragma once
 
@@ -12,9 +12,10 @@ class MKPaint;
 
 class IMKCustomDrawable {
 public:
-    /// Called once for each frame buffer of the target. It is active and its clip is set. projection
-    /// maps the canvas's pixels to clip space.
+    /// Draws. The canvas calls it once for each frame buffer of the target, with that frame buffer active and
+    /// the clip set. projection maps coordinates of the canvas to clip space.
     virtual void DrawRT(Matrix4<float> const& projection, MKPaint const& paint) = 0;
+    /// Take or drop a reference.
     virtual int Ref() = 0;
     virtual int Unref() = 0;
 

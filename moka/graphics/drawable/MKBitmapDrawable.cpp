@@ -24,7 +24,7 @@ namespace {
 constexpr char const* kCopyTag = "MKBitmapDrawable::DrawBitmapRT mDstBitmapForAdvancedBlending";
 constexpr char const* kBatchCopyTag = "MKBitmapDrawable::DrawBitmapRT mDstBitmapForAdvancedBlending 1";
 
-// That driver lets colours exceed alpha.
+// On this GPU colours may exceed alpha.
 constexpr char const* kClampGpu = "Mali-T830";
 
 bool IsDarkenOrLighten(MKPaint const& paint) {
@@ -44,7 +44,7 @@ TexturedVertex* WriteTextured(TexturedVertex* at, RectF const& dst, RectF const&
                      [&](Outline const& outline) { return TexturedCorners(outline, uv); });
 }
 
-// 0 for what is no size, which the factory refuses.
+// Converts to int. Returns 0, which the factory rejects, if the value is not a valid size.
 int ToSize(float value) {
     return value >= 1.0f && value < static_cast<float>(INT_MAX) ? static_cast<int>(value) : 0;
 }

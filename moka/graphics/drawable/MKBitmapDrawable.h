@@ -1,10 +1,11 @@
-// MKBitmapDrawable: draws a rectangle of a bitmap, once or into many places at once, with the paint's
-// blending, alpha, tint and tiling. Darken and lighten are composed by a program, over a copy of the
-// destination that is kept for the next draw onto a target of the same size.
+// MKBitmapDrawable: draws a rectangle of a bitmap once, or many times in one draw, with the paint's blending,
+// alpha, tint and tiling. A program computes the modes Darken and Lighten from a copy of the destination. The
+// copy is kept for the next draw into a target of the same size.
 // Thread: render thread.
-// Units:  those of the projection's source; a bitmap's rectangles in its own pixels.
+// Units:  those before the projection; rectangles of a bitmap in its own pixels.
 // Fails:  without a bitmap, without memory for the copy of the destination, or if a GPU object could not be
-//         created, draw calls do nothing and return false. The constructor passes exceptions of its shaders on.
+//         created, draw calls do nothing and return false. Exceptions of the shaders' constructors pass
+//         through.
 #pragma once
 
 #include "moka/base/NonAssignable.h"
@@ -28,17 +29,17 @@ class MKBitmapShaderColorClamp;
 
 class MKBitmapDrawable : NonAssignable {
 public:
-    // The queue makes the copy of the destination; it is not posted to.
+    // The queue is needed to create the copy of the destination. Nothing is posted to it.
     explicit MKBitmapDrawable(IGLMsgQueue* queue);
     virtual ~MKBitmapDrawable();
 
-    // src, a part of bitmapBounds, fills dst. Of targetBounds only the size is used. With anti-aliasing the
-    // edges of dst get a fringe over which the coverage falls; the texture is not stretched into it.
+    // Draws src, a part of bitmapBounds, scaled to dst. Only the size of targetBounds is used. With
+    // anti-aliasing the edges of dst get a fringe; the texture is not stretched into it.
     bool DrawBitmapRT(IMKBitmapReadable* bitmap, RectF const& bitmapBounds, RectF const& targetBounds,
                       RectF const& src, RectF const& dst, Matrix4<float> const& projection,
                       MKPaint const& paint);
 
-    // The same into each of dsts, in their order, in one draw. The vector stays the caller's.
+    // Draws src scaled to each of dsts, in order, in one draw. The caller keeps the vector.
     bool DrawBitmapsRT(IMKBitmapReadable* bitmap, RectF const& bitmapBounds, RectF const& targetBounds,
                        RectF const& src, std::vector<RectF> const* dsts, Matrix4<float> const& projection,
                        MKPaint const& paint);
@@ -54,10 +55,10 @@ private:
     IGLMsgQueue* mQueue;
     detail::RendererPtr<IGraphicsObject> mGraphics;
     detail::DrawState mState;
-    detail::ShaderPtr<MKBitmapShader> mPlainShader;           // or
-    detail::ShaderPtr<MKBitmapShaderColorClamp> mClampShader; // on the one GPU that needs it
+    detail::ShaderPtr<MKBitmapShader> mPlainShader;           // null on the GPU of kClampGpu
+    detail::ShaderPtr<MKBitmapShaderColorClamp> mClampShader; // null on all other GPUs
     detail::ShaderPtr<MKBitmapAdvancedBlendingShader> mAdvancedShader;
-    RefPtr<IMKBitmap> mDestination; // null until the first draw that darkens or lightens
+    RefPtr<IMKBitmap> mDestination; // null until the first draw with Darken or Lighten
 };
 
 } // namespace Moka

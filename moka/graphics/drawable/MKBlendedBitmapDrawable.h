@@ -1,6 +1,7 @@
-/// MKBlendedBitmapDrawable: a part of two bitmaps, mixed: the paint's alpha is how far from the first to the
-/// second, not an opacity; its colour and tint have no effect.
-/// Units:  destination in the canvas's pixels; source in those of a bitmap of the given size, from its origin.
+/// MKBlendedBitmapDrawable: draws a mix of two bitmaps. The paint's alpha is the share of the second bitmap
+/// (0: only the first one), not an opacity. The paint's colour and tint have no effect.
+/// Units:  destination in the canvas's pixels; source in pixels of a bitmap of the given size, from its
+///         origin.
 /// See CustomDrawable.h for ownership, threads and failures.
 #pragma once
 
@@ -14,19 +15,21 @@ class MKBlenderBitmapsShader;
 
 class MOKA_API MKBlendedBitmapDrawable final : public detail::CustomDrawable<MKBlenderBitmapsShader> {
 public:
-    /// Takes over the caller's references on the bitmaps; the setters take their own. A size of 0 by 0 becomes
-    /// that of the first bitmap at the next draw and stays so.
+    /// Takes ownership of the caller's references on the bitmaps, unlike the setters. A size of 0 x 0 becomes
+    /// that of the first bitmap at the next draw, and stays so.
     // Compat: blend-size
     MKBlendedBitmapDrawable(IGLMsgQueue* queue, IMKBitmap* first, IMKBitmap* second, RectF const& src,
                             RectF const& dst, float width, float height);
     ~MKBlendedBitmapDrawable() override;
 
-    /// Each takes a reference of its own.
+    /// Set a bitmap and take a reference on it.
     void SetBitmapFirst(IMKBitmap* bitmap) { Hold(mBitmap, bitmap); }
     void SetBitmapSecond(IMKBitmap* bitmap) { Hold(mSecondBitmap, bitmap); }
 
-    /// An empty rectangle draws nothing.
+    /// Sets the part of the bitmaps to draw, and the rectangle to draw it into. Empty rectangles draw
+    /// nothing.
     void SetRects(RectF const& src, RectF const& dst);
+    /// Sets the size that src refers to, in pixels.
     void SetSize(float width, float height);
 
     /// The values set; no new reference.

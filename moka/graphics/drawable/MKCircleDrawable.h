@@ -1,9 +1,9 @@
-// MKCircleDrawable: draws circles, always anti-aliased: one quad, whose program measures the distance to the
-// centre, drawn once for the fill and once for the stroke.
+// MKCircleDrawable: draws circles, always anti-aliased. It draws one quad for the fill and one for the
+// stroke; the program computes the distance to the centre.
 // Thread: render thread.
-// Units:  those of the projection's source.
-// Fails:  if a GPU object could not be created, draw calls do nothing. The constructor passes exceptions of
-//         its shader on.
+// Units:  those before the projection.
+// Fails:  if a GPU object could not be created, draw calls do nothing. Exceptions of the shader's constructor
+//         pass through.
 #pragma once
 
 #include "moka/base/NonAssignable.h"
@@ -24,7 +24,7 @@ public:
     MKCircleDrawable();
     virtual ~MKCircleDrawable();
 
-    // Draws strokes of any positive width; other shapes need 1. // Compat: thin-strokes
+    // Draws strokes of any positive width; other shapes require 1. // Compat: thin-strokes
     void DrawCircleRT(PointF const& center, float radius, Matrix4<float> const& projection,
                       MKPaint const& paint);
 

@@ -1,5 +1,5 @@
-/// MKGaussianBlurDrawable: a bitmap at the origin, in its own size, blurred in one direction and tinted if the
-/// paint says so. A full blur is two draws, one in each direction.
+/// MKGaussianBlurDrawable: draws a bitmap at the origin, in its own size, blurred in one direction, with the
+/// paint's tint. For a full blur draw twice, once in each direction.
 /// Units: the bitmap's texels.
 /// See CustomDrawable.h for ownership, threads and failures.
 #pragma once
@@ -18,17 +18,17 @@ public:
     explicit MKGaussianBlurDrawable(IGLMsgQueue* queue);
     ~MKGaussianBlurDrawable() override;
 
-    /// Takes a reference.
+    /// Sets the bitmap and takes a reference on it.
     void SetBitmap(IMKBitmap* bitmap) { Hold(mBitmap, bitmap); }
 
-    /// Horizontal unless set otherwise.
+    /// Sets the direction of the blur. The default is horizontal.
     // Compat: misspelt-names
     void SetHorizotalDirection(bool horizontal) { mHorizontal = horizontal; }
 
-    /// The distance of the nine samples from each other; 1 unless set.
+    /// Sets the distance between the nine samples, in texels. The default is 1.
     void SetBlurAmount(float amount) { mAmount = amount; }
 
-    /// Shifts the content, not the rectangle it is drawn into. The paint's tile mode fills the edges.
+    /// Shifts the content inside the drawn rectangle. The paint's tile mode fills the edges.
     void SetOffset(float x, float y) { mOffset = {x, y}; }
 
     /// The values set; no new reference.

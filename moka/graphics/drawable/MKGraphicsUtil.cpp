@@ -20,7 +20,8 @@ struct Factors {
 
 constexpr Factors kSrcOver = {F::One, F::OneMinusSrcAlpha, F::One, F::OneMinusSrcAlpha};
 
-// By transfer mode, up to the last one that blends.
+// The factors of colour source and destination, and of alpha source and destination, for each transfer mode
+// that blends.
 constexpr Factors kFactors[] = {
     {F::One, F::One, F::One, F::One},                             // Add
     {F::Zero, F::Zero, F::Zero, F::Zero},                         // Clear
@@ -72,7 +73,7 @@ std::array<BlendStateDescriptor, kModes> MakeDescriptors(std::index_sequence<kMo
     return {MakeDescriptor(kFactors[kMode])..., off};
 }
 
-// Every draw needs one, so that they are made once.
+// The descriptors are built once, because every draw needs one.
 std::array<BlendStateDescriptor, kModes> MakeDescriptors() {
     return MakeDescriptors(std::make_index_sequence<MKPaint::BlendingOff>());
 }

@@ -1,4 +1,4 @@
-// MKGraphicsUtil: a paint's settings as states of the renderer.
+// MKGraphicsUtil: converts a paint's settings to the renderer's states.
 #pragma once
 
 #include "moka/graphics/paint/MKPaint.h"
@@ -10,10 +10,11 @@ class IMKBitmapReadable;
 
 class MKGraphicsUtil {
 public:
-    // Colours reach the blender premultiplied. Darken and lighten replace, because a program composes them.
+    // Returns the blend state for premultiplied colours. Darken and Lighten replace the destination, because
+    // a program computes the result.
     static BlendStateDescriptor GetBlendingStateDescriptor(MKPaint::XFermode mode);
 
-    // Render thread. An axis with an unknown tile mode is left as it is.
+    // Sets the bitmap's wrap modes. Skips an axis with an unknown tile mode. Render thread only.
     static void SetTileModeRT(IMKBitmapReadable* bitmap, MKPaint const& paint);
 };
 

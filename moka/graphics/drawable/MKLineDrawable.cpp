@@ -16,7 +16,7 @@ using namespace detail;
 
 namespace {
 
-// What is thinner is not drawn.
+// Thinner lines are not drawn.
 constexpr float kLeastWidth = 1.0f;
 
 // Two fringes and the body between them.
@@ -62,7 +62,7 @@ void SetDashes(MKLineShader& shader, Vector4<float> const& lengths) {
     shader.uDashedLinePatternLength = fourth;
 }
 
-// One line across a segment: so far to the side of its normal, at one coverage.
+// A line parallel to a segment, at a signed distance, with one coverage.
 struct Rail {
     float offset;
     float coverage;
@@ -133,7 +133,7 @@ void MKLineDrawable::DrawLineRT(PointF const& start, PointF const& end, Matrix4<
     WriteLine(vertices, start, end, length, width * 0.5f + 0.5f);
 
     mLineGraphics->SetVertices(0, vertices, kQuadVertices);
-    // A corner lies so far from the end along the line and as far across it.
+    // The corners of the quad lie at this distance from the end, both along the line and across it.
     constexpr float kDiagonal = 1.4143f;
     float const reach = (width * 0.5f + 0.5f) * kDiagonal;
     mLineGraphics->SetBounds(Project(Hull({start.x, start.y, end.x, end.y}, reach), projection));

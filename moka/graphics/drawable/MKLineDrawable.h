@@ -1,10 +1,10 @@
-// MKLineDrawable: draws lines. A full line is one quad, whatever its caps and dashes, which its program
-// makes; simple lines have neither, but any number of them is one call of the renderer.
+// MKLineDrawable: draws lines. A full line is one quad; its program computes caps and dashes. Simple lines
+// have neither, but any number of them is one draw.
 // Thread: render thread.
-// Units:  those of the projection's source.
-// Fails:  if a GPU object could not be created, draw calls do nothing. The constructor passes exceptions of
-//         its shaders on.
-// A line narrower than 1 draws nothing, and one without length nothing that can be seen: it has no direction.
+// Units:  those before the projection.
+// Fails:  if a GPU object could not be created, draw calls do nothing. Exceptions of the shaders'
+//         constructors pass through.
+// A line narrower than 1 draws nothing. A line of length 0 has no direction and shows nothing.
 #pragma once
 
 #include "moka/base/NonAssignable.h"
@@ -28,21 +28,21 @@ public:
     MKLineDrawable();
     virtual ~MKLineDrawable();
 
-    // Always anti-aliased.
+    // Draws a full line, always anti-aliased.
     void DrawLineRT(PointF const& start, PointF const& end, Matrix4<float> const& projection,
                     MKPaint const& paint);
 
-    // Anti-aliased along its sides if the paint says so; the ends are cut square at the points.
+    // Draws a simple line with square ends at the points. Its sides are anti-aliased if the paint enables it.
     void DrawSimpleLineRT(PointF const& start, PointF const& end, Matrix4<float> const& projection,
                           MKPaint const& paint);
 
-    // Points in pairs; an odd last one is ignored. Deletes the vector. If the line is narrower than 1, the
-    // caller keeps the vector. // Compat: points-ownership
+    // Draws a simple line for each pair of points; an odd last point is ignored. Deletes the vector. But if
+    // the line is narrower than 1, the caller keeps the vector. // Compat: points-ownership
     void DrawSimpleLinesRT(std::vector<PointF>* points, Matrix4<float> const& projection,
                            MKPaint const& paint);
 
 private:
-    // points encloses the lines' ends.
+    // points must enclose the ends of all lines.
     void DrawSimpleVertices(void const* vertices, int count, RectF const& points,
                             Matrix4<float> const& projection, MKPaint const& paint);
 

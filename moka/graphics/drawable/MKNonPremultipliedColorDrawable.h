@@ -1,6 +1,6 @@
-/// MKNonPremultipliedColorDrawable: one bitmap over another, at the origin and in the size of the upper one,
-/// as colour that is not premultiplied. Nothing is drawn until both are set.
-/// See CustomDrawable.h for ownership, threads and failures.
+/// MKNonPremultipliedColorDrawable: draws one bitmap over another, at the origin and in the size of the upper
+/// one, and writes colours with straight alpha (not premultiplied). It draws nothing until both bitmaps are
+/// set. See CustomDrawable.h for ownership, threads and failures.
 #pragma once
 
 #include "moka/base/Export.h"
@@ -17,7 +17,7 @@ public:
     explicit MKNonPremultipliedColorDrawable(IGLMsgQueue* queue);
     ~MKNonPremultipliedColorDrawable() override;
 
-    /// src over dst; takes a reference on each.
+    /// Sets the bitmaps: src is drawn over dst. Takes a reference on each.
     void SetBitmap(IMKBitmap* src, IMKBitmap* dst);
 
     /// The bitmaps set; no new reference.

@@ -1,10 +1,10 @@
-// MKRectDrawable: draws rectangles in one colour, filled, stroked or both, in one call of the renderer each.
-// Anti-aliasing is in the triangles: a fringe one unit wide, half of it inside, over which the coverage
+// MKRectDrawable: draws rectangles in one colour, filled, stroked or both, with one draw for each rectangle.
+// Anti-aliased edges have a fringe of triangles one unit wide, half of it inside, over which the coverage
 // falls.
 // Thread: render thread.
-// Units:  those of the projection's source. The fringe and the stroke scale with it.
-// Fails:  if a GPU object could not be created, draw calls do nothing and return false. The constructor passes
-//         exceptions of its shader on.
+// Units:  those before the projection, which scales the fringe and the stroke too.
+// Fails:  if a GPU object could not be created, draw calls do nothing and return false. Exceptions of the
+//         shader's constructor pass through.
 #pragma once
 
 #include "moka/base/NonAssignable.h"

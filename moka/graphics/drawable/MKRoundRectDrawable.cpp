@@ -10,8 +10,8 @@ namespace Moka {
 
 using namespace detail;
 
-// straight holds the edges' straight parts: its left and right bound those of the horizontal edges, its top
-// and bottom those of the vertical ones; its corners are the corners' centres.
+// `straight` bounds the straight parts of the edges: its left and right those of the horizontal edges, its
+// top and bottom those of the vertical ones. Its corners are the centres of the round corners.
 struct MKRoundRectDrawable::Shape {
     Shape(RectF const& r, float wantedRx, float wantedRy)
         : rect(r),
@@ -19,7 +19,7 @@ struct MKRoundRectDrawable::Shape {
           ry(std::min(r.GetHeight() * 0.5f, wantedRy)),
           straight(r.left + rx, r.top + ry, r.right - rx, r.bottom - ry) {}
 
-    // With negative radii the corners' centres lie outside.
+    // With negative radii the centres of the corners lie outside the rectangle.
     RectF GetHull(float reach) const {
         RectF const hull = Hull(rect, reach);
         RectF const centers = Hull(straight, reach);
@@ -35,7 +35,7 @@ struct MKRoundRectDrawable::Shape {
 
 namespace {
 
-// As many as a ring has: a quad for each of the four straight parts.
+// One quad for each of the four straight parts, as many vertices as a ring has.
 constexpr int kBandsVertices = kRingVertices;
 constexpr int kFillVertices = kBandsVertices + 3 * kQuadVertices;
 constexpr int kStrokeVertices = 3 * kBandsVertices;
@@ -52,7 +52,7 @@ CoverageVertex* WriteSolid(CoverageVertex* at, RectF const& rect) {
     return WriteQuad(at, CoverageCorners(Outline{rect, 1}));
 }
 
-// Along the straight parts only, between two outlines.
+// Writes the bands between two outlines, along the straight parts only.
 CoverageVertex* WriteBands(CoverageVertex* at, RectF const& straight, Outline const& outer,
                            Outline const& inner) {
     auto const horizontal = [&](float outerY, float innerY) {
@@ -85,7 +85,8 @@ void WriteStrokeBody(CoverageVertex* at, RectF const& rect, RectF const& straigh
                      });
 }
 
-// Each from its place on the outer rectangle to its centre, which every vertex carries.
+// Writes one quad for each corner, from the corner of the outer rectangle to the centre of the round corner.
+// Every vertex contains that centre.
 void WriteCorners(CornerVertex* at, RectF const& outer, RectF const& centers) {
     auto const corner = [&](float x, float y, float cx, float cy) {
         // cppcheck-suppress uselessAssignmentPtrArg ; the next corner starts there

@@ -1,9 +1,9 @@
-// MKRoundRectDrawable: draws rectangles with elliptic corners, always anti-aliased: the straight parts as
-// fringed triangles, each corner as a quad whose program tests the ellipse.
+// MKRoundRectDrawable: draws rectangles with elliptic corners, always anti-aliased. The straight parts are
+// triangles with a fringe. Each corner is a quad whose program computes the ellipse.
 // Thread: render thread.
-// Units:  those of the projection's source.
-// Fails:  if a GPU object could not be created, draw calls do nothing and return false. The constructor passes
-//         exceptions of its shaders on.
+// Units:  those before the projection.
+// Fails:  if a GPU object could not be created, draw calls do nothing and return false. Exceptions of the
+//         shaders' constructors pass through.
 #pragma once
 
 #include "moka/base/NonAssignable.h"
@@ -25,8 +25,8 @@ public:
     MKRoundRectDrawable();
     virtual ~MKRoundRectDrawable();
 
-    // The radii are at most half of the sides; negative ones are taken as they are. A stroke narrower than 1
-    // draws nothing. Returns what the last draw did.
+    // Limits the radii to half of the sides; negative radii are used unchanged. A stroke narrower than 1
+    // draws nothing. Returns the result of the last draw.
     bool DrawRoundRectRT(RectF const& rect, float rx, float ry, Matrix4<float> const& projection,
                          MKPaint const& paint);
 

@@ -22,7 +22,7 @@ namespace {
 
 constexpr float kFarthest = 4194304.0f;
 
-// A corner of a cell; code is 4 * the cell's segments + the number of the corner.
+// A corner of a cell. code is 4 * StrokeCell::segments + the index of the corner.
 struct StrokeVertex {
     float x;
     float y;
@@ -32,7 +32,7 @@ struct StrokeVertex {
 };
 static_assert(sizeof(StrokeVertex) == sizeof(StrokeCell));
 
-// Vertices are handed over in blocks of so many cells, 33 KB, on the stack.
+// Vertices are set in blocks of this many cells, which take 33 KB of stack.
 constexpr int kBlockCells = 64;
 
 bool IsKept(MKStrokePoint const& point) {
@@ -78,7 +78,7 @@ void DrawCells(IGraphicsObject& graphics, std::vector<StrokeCell> const& cells, 
         if (std::end(vertices) - end < kQuadVertices) draw();
     }
     if (end != vertices) draw();
-    // Without vertices there are none to keep when the list is flushed.
+    // Removes the vertices, so that the object need not copy them when the list is flushed.
     graphics.SetVertices(0, nullptr, 0);
 }
 
@@ -91,7 +91,7 @@ bool IsInView(DrawBounds const& bounds) {
 
 class MKStrokeDrawable::AppendTask final : public ITask {
 public:
-    // Without points: clears.
+    // An empty vector clears the stroke.
     AppendTask(MKStrokeDrawable* stroke, std::vector<MKStrokePoint> points)
         : mStroke(RefPtr<MKStrokeDrawable>::Share(stroke)), mPoints(std::move(points)) {}
 
@@ -121,7 +121,7 @@ MKStrokeDrawable::MKStrokeDrawable(IGLMsgQueue* queue)
 
 MKStrokeDrawable::~MKStrokeDrawable() = default;
 
-// Draws read the points; what changes them is posted by the thread that waits here.
+// Safe after waiting: only tasks posted by this thread change the points.
 std::vector<MKStrokePoint> MKStrokeDrawable::ReadPoints() {
     if (mQueue) mQueue->WaitForTasks();
     return mStroke ? mStroke->GetPoints() : std::vector<MKStrokePoint>();
@@ -169,7 +169,7 @@ void MKStrokeDrawable::DrawRT(Matrix4<float> const& projection, MKPaint const& p
         shader.uToCanvasX = view.GetRow(0);
         shader.uToCanvasY = view.GetRow(1);
         shader.uToCanvasW = view.GetRow(2);
-        // An eighth of a device pixel at least: the GPU rounds corners to less.
+        // At least an eighth of a device pixel. The GPU's rounding of corners is smaller.
         shader.uMargin = static_cast<float>(scale.coarse) * 0.125f;
         DrawCells(GetGraphics(), cells, bounds);
     } catch (std::bad_alloc const&) {

@@ -1,20 +1,20 @@
-/// MKStrokeDrawable: a pen stroke: a disc at each point, and all discs between neighbours, whose places and
-/// widths change linearly. So joins and caps are round. The stroke has one coverage: of its segments the one
-/// that covers a pixel most counts, and the pixel is blended once. So translucent ink is even where segments
-/// meet and where the stroke crosses itself. Colour, alpha, tint and transfer mode come from the paint given
-/// to IMKCanvas::Draw; style, line width, anti-aliasing, dashes and cap of the paint have no effect. Pixels
-/// that the stroke does not cover stay as they are in every transfer mode. Edges are one device pixel soft at
-/// any matrix. Where the stroke is narrower than a device pixel it is drawn one wide, with an alpha that is
-/// less in proportion.
+/// MKStrokeDrawable: a pen stroke. It consists of a disc at each point, and of all discs between neighbouring
+/// points, with linearly interpolated centre and width. So joins and caps are round. Each pixel is blended
+/// once, with the coverage of the segment that covers it most. So translucent ink is even where segments meet
+/// and where the stroke crosses itself. Colour, alpha, tint and transfer mode come from the paint of
+/// IMKCanvas::Draw. The paint's style, line width, anti-aliasing, dashes and cap have no effect. In every
+/// transfer mode, pixels that the stroke does not cover stay unchanged. Edges are one device pixel soft at
+/// any matrix. A stroke narrower than a device pixel is drawn one device pixel wide, with proportionally less
+/// alpha.
 /// Units:  the canvas's pixels before its matrix.
-/// Thread: Append, Clear and GetBounds on one thread at a time; each posts at most one task, in order with
+/// Thread: Append, Clear and GetBounds on one thread at a time. Each posts at most one task, in order with
 ///         draws.
-/// Fails:  appended points are dropped if the queue refuses. Points with NaN or infinite numbers, and points
-///         farther than 4,194,304 pixels from the origin, are left out with one log line for each Append. A
-///         negative width is 0, one above 4,194,304 is that. A stroke without points draws nothing, one of a
-///         single point a disc. If memory runs out, a draw draws nothing.
-/// Cost:   appending is constant time for each point. The first draw at a scale prepares the points, a later
-///         one only those that are new; two scales are remembered, those of equal powers of two being one.
+/// Fails:  appended points are dropped if the queue refuses the task. Points with NaN or infinite numbers,
+///         and points farther than 4,194,304 pixels from the origin, are left out; each Append logs at most
+///         one warning. Widths are clamped to 0 ... 4,194,304. A stroke without points draws nothing, one
+///         with a single point a disc. If memory runs out, a draw draws nothing.
+/// Cost:   appending is constant time for each point. The first draw at a scale prepares all points, later
+///         draws only new ones. Two scales are kept; scales between the same powers of two count as one.
 /// See CustomDrawable.h for ownership.
 #pragma once
 
@@ -35,7 +35,7 @@ class StrokeRT;
 
 /// A point of a stroke, in the canvas's pixels before its matrix.
 struct MKStrokePoint {
-    /// The place.
+    /// The centre.
     float x;
     float y;
     float width; ///< the diameter
@@ -47,16 +47,17 @@ public:
     explicit MKStrokeDrawable(IGLMsgQueue* queue);
     ~MKStrokeDrawable() override;
 
-    /// Continues the stroke; the points are copied. Null or a count below 1 does nothing.
+    /// Appends copies of the points. Null or a count below 1 does nothing.
     void Append(MKStrokePoint const* points, int count);
-    /// Draws posted before still draw the old points.
+    /// Removes all points and keeps their memory. Draws posted before still draw the old points.
     void Clear();
 
-    /// Encloses all points that were appended and kept, with their widths; empty without any. For the caller:
-    /// the canvas does not cull custom drawables. Soft edges reach a device pixel farther.
+    /// The rectangle that encloses all valid points with their widths; empty without points. Soft edges
+    /// extend one device pixel beyond it. Use it to skip strokes outside the view: the canvas does not cull
+    /// custom drawables.
     RectF GetBounds() const { return mBounds; }
 
-    /// All points that were appended and kept. Waits for the render thread, which has them.
+    /// Returns all valid points. Waits for the render thread, which holds them.
     std::vector<MKStrokePoint> ReadPoints();
 
     void DrawRT(Matrix4<float> const& projection, MKPaint const& paint) override;
@@ -67,7 +68,7 @@ private:
     IGLMsgQueue* mQueue;
     RectF mBounds;
     bool mHasBounds = false;
-    std::unique_ptr<detail::StrokeRT> mStroke; // of the render thread
+    std::unique_ptr<detail::StrokeRT> mStroke; // used on the render thread
 };
 
 } // namespace Moka

@@ -1,5 +1,5 @@
-/// MKTextMaskBitmapDrawable: the alpha of a bitmap, painted in the paint's colour; where the alpha is 0
-/// nothing is drawn, in every transfer mode. The colour's own alpha has no effect.
+/// MKTextMaskBitmapDrawable: draws the paint's colour with the alpha of a bitmap. In every transfer mode,
+/// pixels with alpha 0 stay unchanged. The colour's own alpha has no effect.
 /// Units: the canvas's pixels.
 /// See CustomDrawable.h for ownership, threads and failures.
 #pragma once
@@ -18,10 +18,10 @@ public:
     explicit MKTextMaskBitmapDrawable(IGLMsgQueue* queue);
     ~MKTextMaskBitmapDrawable() override;
 
-    /// Takes a reference.
+    /// Sets the mask and takes a reference on it.
     void SetBitmap(IMKBitmap* mask) { Hold(mBitmap, mask); }
 
-    /// Of the mask's upper left corner; the origin unless set.
+    /// Sets the position of the mask's upper left corner. The default is the origin.
     void SetDstPosition(float x, float y) { mPosition = {x, y}; }
 
     /// The values set; no new reference.

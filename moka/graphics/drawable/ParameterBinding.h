@@ -1,7 +1,7 @@
-// ParameterBinding: a uniform of a program as a value to assign to: shader->uColor = paint.GetColor().
-// Owner:  holds the renderer's handle and releases it.
+// ParameterBinding: sets a uniform of a program by assignment: shader->uColor = paint.GetColor().
+// Owner:  owns the renderer's handle.
 // Thread: render thread.
-// Fails:  with an exception and an error line: binding to a uniform of another type, and assigning unbound.
+// Fails:  throws if it is bound to a uniform of another type, or assigned to while unbound.
 #pragma once
 
 #include "moka/base/Export.h"
@@ -46,7 +46,7 @@ struct BindingValue<BindingTypeTextureUnit> {
     using Type = int;
 };
 
-// The part that does not depend on the type. A look-up that throws has released its handle.
+// The type-independent part. LookUpParameter releases the handle before it throws.
 MOKA_API IParameterBinding* LookUpParameter(IShaderProgram* program, char const* name, BindingType wanted);
 [[noreturn]] MOKA_API void ThrowUnbound();
 
@@ -62,8 +62,8 @@ public:
     ParameterBinding(ParameterBinding const&) = delete;
     ParameterBinding& operator=(ParameterBinding const&) = delete;
 
-    // A uniform that the program lacks, or that its compiler removed, is accepted; values assigned to it
-    // are dropped. Throws InvalidArgumentException, and is unbound, when the uniform is of another type.
+    // Binds to a uniform. If the program has no such uniform, or the compiler removed it, assigned values are
+    // ignored. If the uniform has another type, throws InvalidArgumentException and stays unbound.
     void bind(IShaderProgram* program, char const* name) {
         Release();
         mHandle = detail::LookUpParameter(program, name, T);

@@ -1,5 +1,5 @@
-// ProjectedBounds.h: where on the target the vertices of a drawable lie, so that the renderer may join draws that
-// do not touch.
+// ProjectedBounds.h: computes the bounds of a draw on its target, so that the renderer can merge draws that
+// do not overlap others.
 #pragma once
 
 #include "moka/base/Rect.h"
@@ -10,8 +10,8 @@
 
 namespace Moka::detail {
 
-// box is in units of the projection's source; its sides may be in any order. Unknown under a projection with
-// perspective.
+// box is in units before the projection; its sides may be in any order. With perspective the result is
+// unknown.
 inline DrawBounds Project(RectF const& box, Matrix4<float> const& m) {
     if (m[3] != 0.0f || m[7] != 0.0f || m[15] != 1.0f) return {};
     float const x = (box.left + box.right) * 0.5f;
@@ -20,7 +20,7 @@ inline DrawBounds Project(RectF const& box, Matrix4<float> const& m) {
     float const halfHeight = std::fabs(box.bottom - box.top) * 0.5f;
     float const centerX = m[0] * x + m[4] * y + m[12];
     float const centerY = m[1] * x + m[5] * y + m[13];
-    // The GPU rounds in its own way.
+    // A margin for the GPU's rounding.
     constexpr float kLarger = 1.0001f;
     constexpr float kMargin = 1e-5f;
     float const reachX = (std::fabs(m[0]) * halfWidth + std::fabs(m[4]) * halfHeight) * kLarger + kMargin;

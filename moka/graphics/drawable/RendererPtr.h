@@ -1,4 +1,4 @@
-// RendererPtr: owns an object of the renderer's that is given back with Release().
+// RendererPtr: owns an object of the renderer and calls its Release().
 // Thread: render thread, except PostRelease.
 #pragma once
 
@@ -18,8 +18,8 @@ struct ReleaseObject {
 template <class T>
 using RendererPtr = std::unique_ptr<T, ReleaseObject>;
 
-// From any thread; null posts nothing. Refused, the object leaks rather than being released on the wrong
-// thread.
+// Posts the release of the object. Callable on any thread. Null posts nothing. If the queue refuses, the
+// object leaks, because it must not be released on another thread.
 template <class T>
 void PostRelease(IGLMsgQueue* queue, RendererPtr<T> object) {
     if (T* const released = object.release()) WorkerTask::PostMember(queue, released, &T::Release);

@@ -1,5 +1,5 @@
-// ShaderClass.h: the shape that all shader classes share. A class is its table of uniforms; from that come a
-// ParameterBinding for each, named as in GLSL, and the constructor that binds them in the table's order:
+// ShaderClass.h: macros that define shader classes from a table of uniforms. A class has a ParameterBinding
+// for each uniform, named as in GLSL, and a constructor that binds them in the table's order:
 //
 //     #define DISC_UNIFORMS(U)                    kind K stands for BindingTypeK
 //         U(Matrix4, uProjectionMatrix)
@@ -10,17 +10,17 @@
 //     shader->program->MakeCurrent();
 //     shader->uColor = paint.GetColor();
 //
-// Owner:  ShaderManager, which makes one for all who draw with it.
+// Owner:  ShaderManager, which creates one object for all users.
 // Thread: render thread.
-// Fails:  the constructor throws InvalidArgumentException when a uniform is not of the table's type. It
-//         releases the bindings made so far, the last one first, and keeps the program.
+// Fails:  the constructor throws InvalidArgumentException if a uniform does not have the table's type. The
+//         bindings created so far are then released, the last one first; the program leaks.
 #pragma once
 
 #include "moka/graphics/drawable/ParameterBinding.h"
 #include "moka/renderer/IShaderProgram.h"
 #include "moka/renderer/RendererFactory.h"
 
-// NOLINTBEGIN(bugprone-macro-parentheses): what is declared cannot stand in parentheses
+// NOLINTBEGIN(bugprone-macro-parentheses): C++ does not allow parentheses around a declared name
 #define MOKA_SHADER_MEMBER(kind, name) ParameterBinding<BindingType##kind> name;
 #define MOKA_SHADER_BIND(kind, name) name.bind(program, #name);
 
@@ -36,7 +36,7 @@
         IShaderProgram* program;                                                                             \
     };
 
-// The program goes first, then the bindings with their members, the last one first.
+// The destructor releases the program first, then the bindings, the last one first.
 #define MOKA_SHADER_DEFINITION(Class, UNIFORMS, vertexText, fragmentText)                                    \
     Class::Class()                                                                                           \
         : program(RendererFactory::CreateShaderProgram(vertexText, fragmentText, #Class)){                   \

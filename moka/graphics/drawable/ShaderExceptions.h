@@ -1,5 +1,6 @@
-/// ShaderExceptions.h: a program and the code that sets its uniforms disagree: a mistake of the developer's,
-/// thrown when the shader is created, or when a parameter is set that was never bound.
+/// ShaderExceptions.h: exceptions for programming errors: the code that sets a program's uniforms does not
+/// match the program. They are thrown when the shader is created, or when a parameter is set that was never
+/// bound.
 #pragma once
 
 #include "moka/base/Export.h"
@@ -11,7 +12,7 @@ namespace Moka {
 
 namespace detail {
 
-/// A message that needs no memory: it is complete even without memory. Cut at 127 bytes.
+/// A message that is stored without allocating memory, cut at 127 bytes.
 class ShaderMessage {
 public:
     /// Copies text.
@@ -27,7 +28,7 @@ private:
 
 } // namespace detail
 
-/// A uniform is of another type than the binding.
+/// Thrown if a uniform has another type than its binding.
 class MOKA_API InvalidArgumentException : public std::exception {
 public:
     /// Copies message.
@@ -40,7 +41,7 @@ private:
     detail::ShaderMessage mMessage;
 };
 
-/// A value for a binding that is bound to nothing.
+/// Thrown if a value is assigned to an unbound binding.
 class MOKA_API NotSupportedException : public std::exception {
 public:
     /// Copies message.

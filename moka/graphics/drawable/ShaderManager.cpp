@@ -4,8 +4,7 @@
 
 namespace Moka {
 
-// In memory of its own, which is always there, and never destroyed: statics elsewhere may give shaders back while
-// the process ends.
+// Static memory that is never destroyed, because other static objects may release shaders at process exit.
 ShaderManager* ShaderManager::GetInstance() {
     alignas(ShaderManager) static unsigned char memory[sizeof(ShaderManager)];
     static ShaderManager* const instance = new (memory) ShaderManager;

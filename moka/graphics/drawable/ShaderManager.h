@@ -1,9 +1,9 @@
-// ShaderManager: the shader programs in use, one of each class, shared by everything that draws with it: made
-// for the first user, destroyed when the last one gives it back.
-// A shader class has a default constructor that compiles, and a destructor; see ShaderClass.h.
-// Owner:  the process; the shaders are the manager's.
-// Thread: render thread, where the shaders are made and destroyed. A lock is held meanwhile, so that no class
-//         is compiled twice.
+// ShaderManager: holds one shared object of each shader class in use. It creates the object for the first
+// user and deletes it when the last user releases it.
+// The constructor of a shader class compiles the program; see ShaderClass.h.
+// Owner:  one static object for the process, which owns the shaders.
+// Thread: render thread. A lock is held while a shader is created or deleted, so that no class is compiled
+//         twice.
 #pragma once
 
 #include "moka/base/CriticalSection.h"
@@ -22,8 +22,8 @@ namespace Moka {
 
 class MOKA_API ShaderManager : NonAssignable {
 public:
-    // Names a shader class: the text of its run-time type. Compared with such a text as well, so that only a new
-    // entry takes memory: shaders are given back in destructors.
+    // The name of a shader class: typeid(T).name(). It can be compared with such a text directly, so that
+    // looking up a class allocates nothing. Destructors release shaders and must not fail.
     class Key {
     public:
         explicit Key(char const* name) : mName(name) {}
@@ -38,9 +38,9 @@ public:
     // Never null and never destroyed.
     static ShaderManager* GetInstance();
 
-    // The shader of the class, with one user more; give it back with ReleaseShader. Null when memory ran out:
-    // for the shader, whose class then has none from here on, or for its entry, which the next call tries
-    // again. An exception of the shader's constructor passes through and changes nothing.
+    // Returns the shader of the class and counts one more user, who must call ReleaseShader. Returns null if
+    // memory ran out: for the shader, then all later calls for this class return null; or for its entry, then
+    // the next call tries again. Exceptions of the shader's constructor pass through and change nothing.
     template <class T>
     T* GetShader() {
         AutoCriticalSection const hold(mLock);
@@ -51,13 +51,14 @@ public:
             std::unique_ptr<T> shader(new (std::nothrow) T);
             entry = Add(name, shader.get());
             if (!entry) return nullptr;
-            static_cast<void>(shader.release()); // the entry's now
+            static_cast<void>(shader.release()); // the entry owns it
         }
         ++entry->users;
         return static_cast<T*>(entry->shader);
     }
 
-    // Null does nothing; a shader that is not the manager's gets an error line and stays as it is.
+    // Counts one user less. The last one deletes the shader. Null does nothing. An unknown shader logs an
+    // error and is not deleted.
     template <class T>
     void ReleaseShader(T* shader) {
         if (!shader) return;
@@ -72,7 +73,7 @@ public:
         }
     }
 
-    // Forgets the class's shader without destroying it. Does nothing for a class that has none.
+    // Removes the entry of the class without deleting the shader. Does nothing if there is no entry.
     void RemoveShader(Key const& key);
 
 private:
@@ -88,9 +89,9 @@ private:
 
     static void LogNew(char const* name);
     Entry* Find(char const* name);
-    // Null when memory ran out.
+    // Returns null if memory runs out.
     Entry* Add(char const* name, void* shader);
-    // The end, with an error line, when the manager has none of the class or another one.
+    // Returns the entry that holds this shader. If there is none, logs an error and returns the end.
     Entries::iterator FindToRelease(char const* name, void const* shader);
 
     CriticalSection mLock{true}; // recursive: the last release removes the entry while it holds it

@@ -1,4 +1,4 @@
-// ShaderPtr: one use of a program, given back to the shader manager.
+// ShaderPtr: a shared shader, released to the shader manager in the destructor.
 // Thread: render thread.
 #pragma once
 
@@ -16,7 +16,8 @@ struct GiveShaderBack {
 template <class Shader>
 using ShaderPtr = std::unique_ptr<Shader, GiveShaderBack<Shader>>;
 
-// As ShaderManager::GetShader: null when memory ran out; exceptions of the shader's constructor pass.
+// Like ShaderManager::GetShader: returns null if memory runs out; exceptions of the shader's constructor pass
+// through.
 template <class Shader>
 ShaderPtr<Shader> GetShader() {
     return ShaderPtr<Shader>(ShaderManager::GetInstance()->GetShader<Shader>());

@@ -1,6 +1,6 @@
 #include "moka/graphics/drawable/Shaders.h"
 
-// Made by the build from shaders/.
+// The build generates this header from shaders/.
 #include "moka/graphics/drawable/ShaderSources.h"
 
 namespace Moka {

@@ -1,6 +1,7 @@
-// Shaders.h: the thirteen programs that the library draws with. CMakeLists.txt here says which GLSL files each
-// is made of; the files say what a vertex is. Every vertex stage maps pixels of the canvas by its projection.
-// Colours come in as the paint has them and leave premultiplied. The flags are ints: 1 is on.
+// Shaders.h: the thirteen programs that the library draws with. CMakeLists.txt in this folder lists the GLSL
+// files of each; the files declare the vertices. Every vertex stage applies the projection to coordinates of
+// the canvas. Input colours are those of the paint; output colours are premultiplied. Flags are ints: 1 is
+// on.
 #pragma once
 
 #include "moka/graphics/drawable/ShaderClass.h"
@@ -13,7 +14,7 @@ namespace Moka {
     U(Vector4, uTintColor)                                                                                   \
     U(Int, uHasTintColor)
 
-// One colour under the coverage that the vertices carry.
+// One colour, multiplied by the coverage of the vertices.
 MOKA_SHADER_CLASS(MKRectShader, MOKA_COLOR_UNIFORMS)
 // The straight parts of a rounded rectangle.
 MOKA_SHADER_CLASS(MKRoundRectShader, MOKA_COLOR_UNIFORMS)
@@ -34,8 +35,8 @@ MOKA_SHADER_CLASS(MKRoundRectRoundShader, MOKA_ROUND_RECT_ROUND_UNIFORMS)
     U(Float, uRadius)
 MOKA_SHADER_CLASS(MKCircleShader, MOKA_CIRCLE_UNIFORMS)
 
-// A segment with caps and dashes. uLineInfo is half the width and the length; uDashedLinePattern says where
-// each of dash, gap, dash, gap ends.
+// A segment with caps and dashes. uLineInfo is half the width, and the length. uDashedLinePattern contains
+// the ends of dash, gap, dash, gap.
 #define MOKA_LINE_UNIFORMS(U)                                                                                \
     MOKA_COLOR_UNIFORMS(U)                                                                                   \
     U(Vector2, uLineInfo)                                                                                    \
@@ -52,10 +53,10 @@ MOKA_SHADER_CLASS(MKLineShader, MOKA_LINE_UNIFORMS)
     U(Vector4, uTintColor)                                                                                   \
     U(Int, uHasTintColor)
 MOKA_SHADER_CLASS(MKBitmapShader, MOKA_BITMAP_UNIFORMS)
-// For a GPU that lets colours exceed alpha.
+// Clamps colours to alpha, for one GPU on which they may exceed it.
 MOKA_SHADER_CLASS(MKBitmapShaderColorClamp, MOKA_BITMAP_UNIFORMS)
 
-// Composes with a copy of the destination: uBlendingMode 1 darkens, 2 lightens.
+// Blends with a copy of the destination. uBlendingMode 1 is Darken, 2 is Lighten.
 #define MOKA_BITMAP_ADVANCED_BLENDING_UNIFORMS(U)                                                            \
     U(Matrix4, uProjectionMatrix)                                                                            \
     U(TextureUnit, uSrcTexture)                                                                              \
@@ -67,7 +68,7 @@ MOKA_SHADER_CLASS(MKBitmapShaderColorClamp, MOKA_BITMAP_UNIFORMS)
     U(Int, uBlendingMode)
 MOKA_SHADER_CLASS(MKBitmapAdvancedBlendingShader, MOKA_BITMAP_ADVANCED_BLENDING_UNIFORMS)
 
-// The mix of two bitmaps; the colours are set without effect.
+// A mix of two bitmaps. The colours have no effect.
 #define MOKA_BLENDER_BITMAPS_UNIFORMS(U)                                                                     \
     U(Matrix4, uProjectionMatrix)                                                                            \
     U(TextureUnit, uSrcTexture1)                                                                             \
@@ -85,7 +86,7 @@ MOKA_SHADER_CLASS(MKBlenderBitmapsShader, MOKA_BLENDER_BITMAPS_UNIFORMS)
     U(Vector4, uMaskColor)
 MOKA_SHADER_CLASS(MKTextMaskBitmapShader, MOKA_TEXT_MASK_BITMAP_UNIFORMS)
 
-// One bitmap over another, leaving not premultiplied.
+// One bitmap over another. The output colour is not premultiplied.
 #define MOKA_NON_PREMULTIPLIED_COLOR_UNIFORMS(U)                                                             \
     U(Matrix4, projectionMatrix)                                                                             \
     U(TextureUnit, srcTexture)                                                                               \
@@ -102,8 +103,8 @@ MOKA_SHADER_CLASS(MKNonPremultipliedColorShader, MOKA_NON_PREMULTIPLIED_COLOR_UN
     U(Float, blurAmount)
 MOKA_SHADER_CLASS(MKGaussianBlurShader, MOKA_GAUSSIAN_BLUR_UNIFORMS)
 
-// A stroke under the maximum of its segments' coverages. The uToCanvas rows map the target's pixels to the
-// canvas's.
+// A stroke with the maximum coverage of its segments. The uToCanvas rows map pixels of the target to the
+// canvas.
 #define MOKA_STROKE_UNIFORMS(U)                                                                              \
     MOKA_COLOR_UNIFORMS(U)                                                                                   \
     U(Vector4, uToCanvasX)                                                                                   \

@@ -1,28 +1,31 @@
 #include "moka/graphics/drawable/StrokeCells.h"
 
 #include <algorithm>
+#include <array>
 #include <limits>
 
 namespace Moka::detail {
 namespace {
 
-// Sides of the leaves that a segment asks for, the greatest of them: in device pixels, of its radius, and of its
-// length.
+// The side of the leaves for a segment is the greatest of these three: in device pixels, relative to the
+// segment's radius, and relative to its length.
 constexpr double kLeafPixels = 8;
 constexpr double kLeafOfRadius = 0.25;
 constexpr double kLeafOfLength = 1.0 / 64;
-// A leaf with more segments is split, down to this side in device pixels; then the nearest ones are kept.
+// A leaf with more segments is split, down to this side in device pixels. Beyond that, the nearest
+// kMostEntries are kept.
 constexpr int kManyEntries = 24;
 constexpr double kLeastLeafPixels = 0.25;
-constexpr int kMostEntries = 64;
+constexpr std::size_t kMostEntries = 64; // a leaf that may be split has fewer
 constexpr std::size_t kKeptEntries = 32;
-// Of a cell, in device pixels.
+// The smallest side of a cell, in device pixels.
 constexpr double kLeastCellPixels = 0.25;
-// A thinner segment counts as good as one that fades as little as this more.
+// Segments thinner than a device pixel fade. One that is at least this fraction as wide as another counts as
+// equal.
 constexpr double kAsWide = 0.95;
 
-// Points of a cell that has too many are left out if they are off by less, in device pixels; of a stroke that fades,
-// as much more as it fades.
+// A cell with too many points drops those that deviate from the line between their neighbours by less than
+// this, in device pixels. The tolerance grows for thin strokes, which fade.
 constexpr double kLoose = 1.0 / 24;
 
 constexpr std::size_t kCellPoints = StrokeCell::kPoints;
@@ -47,6 +50,16 @@ void StrokeCells::Add(StrokeSegment const& segment, bool mayBeTakenBack) {
 void StrokeCells::TakeBackLast() {
     Remove(0, mRoot, static_cast<int>(mSegments.size()) - 1);
     mSegments.pop_back();
+    mMayTakeBack = false;
+}
+
+void StrokeCells::Clear() {
+    mSegments.clear();
+    mNodes.clear();
+    mEntries.clear();
+    mCells.clear();
+    mNextCell.clear();
+    mFreeCell = kNone;
     mMayTakeBack = false;
 }
 
@@ -75,7 +88,7 @@ bool StrokeCells::IsFull(Candidate const& candidate) const {
     return candidate.most <= -half && mSegments[At(candidate.segment)].GetLeastRadius() >= half;
 }
 
-// The distance to a convex shape is a convex function, so a corner is farthest.
+// The distance to a convex shape is a convex function, so its maximum over the square is at a corner.
 double StrokeCells::FindMost(Candidate const& candidate, Square const& square) const {
     StrokeSegment const& segment = mSegments[At(candidate.segment)];
     double const right = square.x + square.side;
@@ -84,13 +97,13 @@ double StrokeCells::FindMost(Candidate const& candidate, Square const& square) c
                      segment.GetEdge(square.x, bottom), segment.GetEdge(right, bottom)});
 }
 
-// Whether best covers each pixel of the square as much as the candidate.
+// True if best covers each pixel of the square at least as much as the candidate.
 bool StrokeCells::IsBeaten(Candidate const& candidate, Candidate const& best) const {
     if (!mScale.isEven || best.most > candidate.least) return false;
     StrokeSegment const& winner = mSegments[At(best.segment)];
     double const half = mScale.coarse * 0.5;
     StrokeSegment const& loser = mSegments[At(candidate.segment)];
-    // Neither fades.
+    // Both are at least one device pixel wide, so neither fades.
     if (winner.GetLeastRadius() >= half && loser.GetLeastRadius() >= half) return true;
     double const most = best.most + winner.GetGreatestRadius();
     return most <= candidate.least + loser.GetLeastRadius() &&
@@ -156,18 +169,20 @@ void StrokeCells::AddEntry(int node, int segment) {
 
 void StrokeCells::Split(int node, Square const& square, double target) {
     FreeCells(node);
-    std::vector<int> segments;
-    for (int i = mNodes[At(node)].entries; i != kNone; i = mEntries[At(i)].next) {
-        segments.push_back(mEntries[At(i)].segment);
+    std::array<int, kMostEntries> segments; // the latest first
+    auto end = segments.begin();
+    for (int i = mNodes[At(node)].entries; i != kNone && end != segments.end(); i = mEntries[At(i)].next) {
+        *end++ = mEntries[At(i)].segment;
     }
     int const children = static_cast<int>(mNodes.size());
     mNodes.resize(mNodes.size() + 4);
     mNodes[At(node)].children = children;
     mNodes[At(node)].entries = kNone;
     mNodes[At(node)].entryCount = 0;
-    // The first ones first, as they came.
-    for (auto segment = segments.rbegin(); segment != segments.rend(); ++segment) {
-        for (int i = 0; i < 4; ++i) Insert(children + i, square.GetQuarter(i), *segment, target);
+    // Keeps the order in which the segments were added.
+    while (end != segments.begin()) {
+        --end;
+        for (int i = 0; i < 4; ++i) Insert(children + i, square.GetQuarter(i), *end, target);
     }
 }
 
@@ -213,8 +228,9 @@ void StrokeCells::FreeCellsBelow(int node) {
 }
 
 void StrokeCells::LimitEntries(int node, Square const& square) {
-    if (mNodes[At(node)].entryCount < kMostEntries) return;
-    std::vector<Candidate> candidates;
+    if (At(mNodes[At(node)].entryCount) < kMostEntries) return;
+    std::vector<Candidate>& candidates = mCandidates;
+    candidates.clear();
     for (int i = mNodes[At(node)].entries; i != kNone; i = mEntries[At(i)].next) {
         candidates.push_back(Judge(mEntries[At(i)].segment, square));
     }
@@ -249,7 +265,7 @@ void StrokeCells::MakeNode(int node, Square const& square) {
     MakePart(node, square, 0);
 }
 
-// Of the candidates from begin on those that count in the square are put behind them.
+// Appends those candidates from begin on that are relevant in the square to mCandidates.
 void StrokeCells::MakePart(int node, Square const& square, std::size_t begin) {
     std::size_t const end = mCandidates.size();
     std::size_t best = end;
@@ -284,7 +300,8 @@ void StrokeCells::MakePart(int node, Square const& square, std::size_t begin) {
     mCandidates.resize(end);
 }
 
-// The points of the candidates from begin on, which are in the order of their numbers: neighbours share one.
+// Collects the points of the candidates from begin on, which are sorted by number. Consecutive segments share
+// a point.
 void StrokeCells::Collect(std::size_t begin) {
     mPoints.clear();
     int last = -2;
@@ -297,7 +314,7 @@ void StrokeCells::Collect(std::size_t begin) {
     }
 }
 
-// Leaves out points between others until a cell has room for the rest. False if it has not.
+// Drops points between others until the rest fits into a cell. Returns false if that is not possible.
 bool StrokeCells::Thin() {
     while (mPoints.size() > kCellPoints) {
         std::size_t found = 0;
@@ -320,7 +337,7 @@ bool StrokeCells::Thin() {
     return true;
 }
 
-// Of points that do not fit into one cell, the smallest that there is, the farthest segments are left out.
+// Drops the farthest segments of a cell that has too many points and cannot be divided further.
 void StrokeCells::KeepNearest(Square const& square) {
     double const x = square.x + square.side * 0.5;
     double const y = square.y + square.side * 0.5;
@@ -339,7 +356,7 @@ void StrokeCells::KeepNearest(Square const& square) {
     }
 }
 
-// Those joined to no other.
+// Drops points that no segment uses.
 void StrokeCells::DropSinglePoints() {
     std::size_t kept = 0;
     for (std::size_t i = 0; i < mPoints.size(); ++i) {
@@ -368,7 +385,7 @@ void StrokeCells::MakeCell(int node, Square const& square) {
     cell.segments = static_cast<float>(bits);
 }
 
-// Of a segment that lies on one side of the diagonal, with its radius and its fringe.
+// Returns the triangles of the square that the segment, with its radius and fringe, may touch.
 int StrokeCells::FindHalves(Square const& square, StrokeSegment const& segment) const {
     double const middle = square.x + square.y + square.side;
     double const a = segment.a.x + segment.a.y - middle;

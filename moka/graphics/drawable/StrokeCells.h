@@ -1,12 +1,12 @@
-// StrokeCells: divides the plane under a stroke into squares, cells, so that each knows all segments that can
-// cover a pixel in it: at most five, of six points. Cells do not overlap; so a pixel is drawn once, and its
-// coverage is the maximum over the segments of its cell.
-// A quadtree takes the segments; a leaf whose segments are too many for one cell is drawn as several.
+// StrokeCells: divides the plane under a stroke into square cells. Each cell contains all segments that can
+// cover one of its pixels: at most five segments with six points. Cells do not overlap, so each pixel is
+// drawn once, with the maximum coverage of the segments of its cell.
+// A quadtree holds the segments. A leaf with too many segments for one cell is drawn as several cells.
 // Thread: render thread.
 // Units:  canvas pixels.
-// Fails:  bad_alloc; the cells are useless then.
-// Cost:   a segment lies in a bounded number of leaves. Where many overlap, leaves become smaller, until a
-//         segment covers them whole and they keep that one only.
+// Fails:  throws bad_alloc; the object must then be discarded.
+// Cost:   a segment lies in a bounded number of leaves. Where many segments overlap, leaves are divided until
+//         one segment covers a leaf completely; the leaf then keeps only that one.
 #pragma once
 
 #include "moka/graphics/drawable/StrokeSegment.h"
@@ -17,26 +17,29 @@ namespace Moka::detail {
 
 struct StrokeCell {
     static constexpr int kPoints = 6;
-    // Of segments: the triangles that are not empty.
+    // Bits of segments: the triangles that contain a segment.
     static constexpr int kUpperLeft = 32;
     static constexpr int kLowerRight = 64;
 
-    float x; // of the left upper corner
+    float x; // of the upper left corner
     float y;
     float side;                // 0: not in use
     float segments;            // bit i: the points i and i + 1 are joined
-    float points[3 * kPoints]; // x and y from the corner on, radius
+    float points[3 * kPoints]; // x and y relative to the corner, and the radius
 };
 
 class StrokeCells {
 public:
     explicit StrokeCells(StrokeScale const& scale) : mScale(scale) {}
 
-    // Of the segments, which are numbered from 0 on, the last one may be taken back.
+    // Adds a segment; the first one has number 0. TakeBackLast removes the last one if mayBeTakenBack was
+    // true.
     void Add(StrokeSegment const& segment, bool mayBeTakenBack);
     void TakeBackLast();
+    // Removes all segments and keeps their memory.
+    void Clear();
 
-    // Brings the cells up to date with the segments.
+    // Updates and returns the cells.
     std::vector<StrokeCell> const& Make();
 
 private:
@@ -47,14 +50,14 @@ private:
         int entries = kNone;
         int cells = kNone;
         int entryCount = 0;
-        bool isFull = false; // covered by the one segment that it has
+        bool isFull = false; // completely covered by its only segment
         bool isChanged = false;
     };
     struct Entry {
         int segment;
         int next;
     };
-    // Of a node: where it lies.
+    // The area of a node.
     struct Square {
         double x;
         double y;
@@ -67,13 +70,13 @@ private:
     };
     struct Candidate {
         int segment;
-        double least; // at least so far all of the square lies outside of the segment's edge
-        double most;  // at most; negative inside
+        double least; // lower bound of the distance from the segment's edge to the square; negative inside
+        double most;  // upper bound
     };
 
     struct Point {
         StrokeNode node;
-        bool isJoined; // to the one before
+        bool isJoined; // a segment joins it to the point before
     };
 
     Candidate Judge(int segment, Square const& square) const;
@@ -109,10 +112,10 @@ private:
     std::vector<Node> mNodes;
     std::vector<Entry> mEntries;
     std::vector<StrokeCell> mCells;
-    std::vector<int> mNextCell; // of the same node, or free
+    std::vector<int> mNextCell; // the next cell of the same node, or the next free one
     int mFreeCell = kNone;
-    std::vector<Candidate> mCandidates; // while cells are made
-    std::vector<Point> mPoints;         // of the cell that is made
+    std::vector<Candidate> mCandidates; // used while cells are created or entries are limited
+    std::vector<Point> mPoints;         // of the cell that is being created
 };
 
 } // namespace Moka::detail

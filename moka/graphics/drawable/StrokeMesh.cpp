@@ -8,7 +8,8 @@
 namespace Moka::detail {
 namespace {
 
-// How far a point that is left out may be off, and how much its radius, in device pixels.
+// The largest deviation of a dropped point from the segment that replaces it, in position and radius, in
+// device pixels.
 constexpr double kStrokeTolerance = 1.0 / 24;
 
 } // namespace
@@ -23,6 +24,12 @@ std::vector<StrokeCell> const& StrokeMesh::Update(std::vector<MKStrokePoint> con
         mCells.Add({mKept, mOpenCount == 0 ? mKept : mOpen[mOpenCount - 1]}, true);
     }
     return mCells.Make();
+}
+
+void StrokeMesh::Clear() {
+    mCells.Clear();
+    mTaken = 0;
+    mOpenCount = 0;
 }
 
 void StrokeMesh::Take(StrokeNode const& point) {

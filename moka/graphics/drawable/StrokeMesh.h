@@ -1,8 +1,8 @@
-// StrokeMesh: a stroke's cells at one scale. Points that lie on the way between others, to a fraction of a
-// device pixel, are left out; the way from the last point kept to the last point is provisional, as the next
-// points may continue it.
+// StrokeMesh: the cells of a stroke at one scale. It drops points that lie between others to a fraction of a
+// device pixel. The segment from the last kept point to the end of the stroke is provisional, because later
+// points may extend it.
 // Thread: render thread.
-// Fails:  bad_alloc; the mesh is useless then.
+// Fails:  throws bad_alloc; the mesh must then be discarded.
 // Cost:   constant for each new point.
 #pragma once
 
@@ -23,11 +23,15 @@ public:
 
     StrokeScale const& GetScale() const { return mScale; }
 
-    // Takes the points that it does not have yet; those before have not changed. There is at least one.
+    // Adds the points that are new since the last call; earlier ones must not change. There must be at least
+    // one point.
     std::vector<StrokeCell> const& Update(std::vector<MKStrokePoint> const& points);
 
+    // As at the start; keeps the memory.
+    void Clear();
+
 private:
-    // Of points that are left out one after the other.
+    // The most consecutive points that are dropped.
     static constexpr std::size_t kMostSkipped = 32;
 
     void Take(StrokeNode const& point);
@@ -37,7 +41,7 @@ private:
     StrokeCells mCells;
     std::size_t mTaken = 0;
     StrokeNode mKept{};
-    // Behind the one kept; the last one is the end of the stroke.
+    // The points after mKept. The last one is the end of the stroke.
     std::array<StrokeNode, kMostSkipped> mOpen{};
     std::size_t mOpenCount = 0;
 };

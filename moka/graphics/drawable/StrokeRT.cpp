@@ -22,8 +22,9 @@ void StrokeRT::Append(std::vector<MKStrokePoint> const& points) {
 }
 
 void StrokeRT::Clear() {
-    mPoints = {};
-    mMeshes = {};
+    mPoints.clear();
+    for (auto const& mesh : mMeshes)
+        if (mesh) mesh->Clear();
 }
 
 double StrokeRT::GetExtent() const {

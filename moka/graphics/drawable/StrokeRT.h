@@ -1,6 +1,6 @@
-// StrokeRT: the render thread's half of a stroke: its points, and the meshes made of them.
-// Thread: render thread; made and destroyed on any.
-// Fails:  bad_alloc from Find, which the next call recovers from.
+// StrokeRT: the render-thread part of a stroke: its points and their meshes.
+// Thread: render thread. It may be created and deleted on any thread.
+// Fails:  Find throws bad_alloc; the next call tries again.
 #pragma once
 
 #include "moka/base/Rect.h"
@@ -13,18 +13,18 @@
 
 namespace Moka::detail {
 
-// Grows to the point's disc. The first point of a box is not enclosed yet.
+// Grows box to enclose the point's disc. For the first point, box is set to the disc.
 void EncloseStrokePoint(RectF& box, bool isFirst, MKStrokePoint const& point);
 
 class StrokeRT {
 public:
-    // bad_alloc leaves the stroke as it was.
+    // Throws bad_alloc; the stroke is then unchanged.
     void Append(std::vector<MKStrokePoint> const& points);
-    void Clear();
+    void Clear(); // keeps the memory, so that ink drawn anew in each frame allocates nothing
     std::vector<MKStrokePoint> const& GetPoints() const { return mPoints; }
 
     bool IsEmpty() const { return mPoints.empty(); }
-    // Of a stroke that is not empty.
+    // The stroke must not be empty.
     RectF const& GetBounds() const { return mBounds; }
     double GetExtent() const;
 
@@ -34,7 +34,7 @@ public:
 private:
     std::vector<MKStrokePoint> mPoints;
     RectF mBounds;
-    std::array<std::unique_ptr<StrokeMesh>, 2> mMeshes; // the last one used first
+    std::array<std::unique_ptr<StrokeMesh>, 2> mMeshes; // the most recently used first
 };
 
 } // namespace Moka::detail

@@ -1,6 +1,6 @@
-// StrokeSegment.h: the parts of a stroke as its cells see them.
+// StrokeSegment.h: points and segments of a stroke, in double precision.
 // Thread: any.
-// Units:  canvas pixels, in double precision.
+// Units:  canvas pixels.
 #pragma once
 
 #include <algorithm>
@@ -8,7 +8,8 @@
 
 namespace Moka::detail {
 
-// A stroke thinner than a device pixel fades, and shows deviations less; down to this width.
+// A stroke thinner than a device pixel fades and shows deviations less, so tolerances grow, down to this
+// width.
 constexpr double kThinnestStroke = 0.25;
 
 struct StrokeNode {
@@ -17,18 +18,18 @@ struct StrokeNode {
     double radius;
 };
 
-// Canvas pixels that a device pixel is long: at most coarse and at least fine, both powers of two.
+// The size of a device pixel in canvas pixels: between fine and coarse, which are powers of two.
 struct StrokeScale {
     double coarse = 1;
     double fine = 1;
-    bool isEven = true; // the same in all directions
+    bool isEven = true; // the size is the same in all directions
 
     friend bool operator==(StrokeScale const& a, StrokeScale const& b) {
         return a.coarse == b.coarse && a.fine == b.fine && a.isEven == b.isEven;
     }
 };
 
-// All discs between two: with tangents to both, not with parallel sides.
+// All discs between two discs: their hull, bounded by the tangents to both.
 struct StrokeSegment {
     StrokeNode a;
     StrokeNode b;
@@ -38,7 +39,7 @@ struct StrokeSegment {
         double radius;   // of that disc
     };
 
-    // The disc whose edge is nearest. As the shader finds it.
+    // Returns the disc whose edge is nearest to the point. The shader uses the same formula.
     Nearest Find(double x, double y) const {
         double const lineX = b.x - a.x;
         double const lineY = b.y - a.y;
@@ -53,7 +54,7 @@ struct StrokeSegment {
         }
         return Measure(x, y, t);
     }
-    // The disc whose centre is nearest.
+    // Returns the disc whose centre is nearest to the point.
     Nearest FindCenter(double x, double y) const {
         double const lineX = b.x - a.x;
         double const lineY = b.y - a.y;
@@ -61,12 +62,12 @@ struct StrokeSegment {
         double const along = (x - a.x) * lineX + (y - a.y) * lineY;
         return Measure(x, y, square > 0 ? std::clamp(along / square, 0.0, 1.0) : 0.0);
     }
-    // How far outside of the edge; negative inside.
+    // Returns the distance of the point from the segment's edge; negative inside.
     double GetEdge(double x, double y) const {
         Nearest const nearest = Find(x, y);
         return nearest.distance - nearest.radius;
     }
-    // Not more than the distance of the line from a square around a point.
+    // Returns a lower bound of the distance of the line from a square around the point.
     double GetGap(double x, double y, double half) const {
         double const lineX = b.x - a.x;
         double const lineY = b.y - a.y;

@@ -12,9 +12,10 @@ Row Cross(Row const& a, Row const& b) {
     return {a[1] * b[2] - a[2] * b[1], a[2] * b[0] - a[0] * b[2], a[0] * b[1] - a[1] * b[0]};
 }
 
-// Directions that differ by less count as one.
+// Scales of two directions whose ratio is below this count as equal.
 constexpr double kEven = 1.02;
-// Of the power of two of a device pixel: floats tell cells apart that are this much smaller than their place.
+// The scale is at least 2^-19 of the largest coordinate, because floats cannot distinguish the corners of
+// smaller cells.
 constexpr int kPlaceBits = 19;
 constexpr int kGreatest = 40;
 
@@ -28,7 +29,7 @@ StrokeView::StrokeView(Matrix4<float> const& m, int width, int height) : mWidth(
         x[i] = (x[i] + w[i]) * 0.5 * width;
         y[i] = (y[i] + w[i]) * 0.5 * height;
     }
-    // The inverse's columns.
+    // The columns of the inverse.
     Row const first = Cross(y, w);
     Row const second = Cross(w, x);
     Row const third = Cross(x, y);
@@ -48,7 +49,7 @@ Vector4<float> StrokeView::GetRow(int row) const {
     return {static_cast<float>(values[0]), static_cast<float>(values[1]), static_cast<float>(values[2]), 0};
 }
 
-// The singular values of the derivative.
+// Returns the singular values of the derivative at a pixel.
 StrokeView::Range StrokeView::MeasurePixel(double x, double y) const {
     auto const at = [&](std::size_t row) {
         return mToCanvas[row][0] * x + mToCanvas[row][1] * y + mToCanvas[row][2];
@@ -81,7 +82,7 @@ StrokeScale StrokeView::GetScale(double extent) const {
                                                                : -kGreatest;
         return std::clamp(exponent, smallest, kGreatest);
     };
-    // The rounding of a view of exactly a power of two must not double it.
+    // If the scale is a power of two, rounding errors must not double it.
     int const coarse = power(range.most * (1 - 1e-6)) + 1;
     int const fine = std::min(power(range.least * (1 + 1e-6)), coarse);
     return {std::ldexp(1.0, std::min(coarse, kGreatest)), std::ldexp(1.0, fine),

@@ -1,4 +1,4 @@
-// StrokeView: how a target's pixels lie on the canvas: the inverse of a projection and a viewport.
+// StrokeView: maps pixels of the target to the canvas: the inverse of a projection and a viewport.
 // Thread: any.
 #pragma once
 
@@ -12,14 +12,15 @@ namespace Moka::detail {
 
 class StrokeView {
 public:
-    // Of a viewport of this size, in pixels.
+    // width and height are those of the viewport, in pixels.
     StrokeView(Matrix4<float> const& projection, int width, int height);
 
-    // False if the projection has no inverse: nothing can be seen.
+    // False if the projection has no inverse. Nothing is visible then.
     bool IsValid() const { return mIsValid; }
-    // Dot products with (gl_FragCoord.xy, 1) are homogeneous coordinates on the canvas. w is 0.
+    // The dot products of the three rows with (gl_FragCoord.xy, 1) are homogeneous coordinates on the canvas.
+    // The row's w is 0.
     Vector4<float> GetRow(int row) const;
-    // For strokes that reach so far from the canvas's origin.
+    // Returns the scale for strokes whose coordinates do not exceed extent.
     StrokeScale GetScale(double extent) const;
 
 private:

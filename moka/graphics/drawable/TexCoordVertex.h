@@ -1,4 +1,4 @@
-// TexCoordVertex: the vertices of a whole bitmap, each a place and a texture coordinate, without a coverage.
+// TexCoordVertex: a vertex of a bitmap, with a position and a texture coordinate, without a coverage.
 #pragma once
 
 #include "moka/graphics/bitmap/IMKBitmap.h"
@@ -16,7 +16,7 @@ struct TexCoordVertex {
 constexpr int kStripVertices = 4;
 static_assert(sizeof(Corners<TexCoordVertex>) == kStripVertices * sizeof(TexCoordVertex));
 
-// The bitmap in its own size, with its upper left corner at (x, y).
+// The corners of the bitmap in its own size, with the upper left one at (x, y).
 inline Corners<TexCoordVertex> TexCoordCorners(IMKBitmap const& bitmap, float x, float y, RectF const& uv) {
     float const right = x + static_cast<float>(bitmap.GetWidth());
     float const bottom = y + static_cast<float>(bitmap.GetHeight());

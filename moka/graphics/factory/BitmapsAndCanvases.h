@@ -1,17 +1,15 @@
-/// BitmapsAndCanvases: named functions over MKGraphicsFactory, whose results count their references
-/// themselves.
+/// BitmapsAndCanvases: functions that call MKGraphicsFactory and return reference-counted pointers.
 ///     auto bitmap = NewBitmap(*queue, 400, 400);
 ///     auto canvas = NewCanvas(*queue, bitmap);
 ///     canvas->DrawCircle(200, 200, 100, nullptr);
 ///     SaveBitmap(*bitmap, "circle.png");
-/// Owner:  the returned pointer holds the first reference; copies of it hold more. Pixels are copied, or
-///         taken over where the parameter says so.
-/// Thread: UseFrom says where the result will be used. For AnyThread any thread may call, and the work is
-///         posted to queue. For RenderThread only queue's render thread may. ReadBitmap and SaveBitmap wait
-///         for the render thread, so a task must not call them with a bitmap for AnyThread.
+/// Owner:  the returned pointer holds the first reference; copies of it hold more.
+/// Thread: UseFrom selects the threads that use the result. With AnyThread any thread may call, and the work
+///         is posted to queue. With RenderThread only the render thread of queue may call. ReadBitmap and
+///         SaveBitmap wait for the render thread, so a task must not call them with a bitmap for AnyThread.
 /// Units:  pixels; RGBA8, premultiplied. Paths are the bytes of a file's name.
-/// Fails:  with a null pointer or false, and log an error, as MKGraphicsFactory and BitmapFactory do. A null
-///         bitmap gives a null canvas.
+/// Fails:  return null or false and log an error, as MKGraphicsFactory and BitmapFactory do. With a null
+///         bitmap the canvas is null.
 #pragma once
 
 #include "moka/base/Bitmap.h"
@@ -34,24 +32,25 @@
 
 namespace Moka {
 
-/// Where an object is used. The order is the factory's: without and with the queue.
-enum class UseFrom { RenderThread, AnyThread }; ///< in the factory's order: without and with the queue
+/// The threads that an object is used from. The values are those of the factory's parameter useQueue.
+enum class UseFrom { RenderThread, AnyThread };
 
-/// From tightly packed pixels, which stay the caller's and valid until the render thread has uploaded them.
+/// Creates a bitmap from tightly packed pixels. The caller keeps them valid until the render thread has
+/// uploaded them.
 inline RefPtr<IMKBitmap> NewBitmap(IGLMsgQueue& queue, int width, int height, void const* pixels,
                                    UseFrom from = UseFrom::AnyThread) {
     return RefPtr<IMKBitmap>::Adopt(
         MKGraphicsFactory::CreateBitmap(&queue, width, height, pixels, false, static_cast<int>(from), false));
 }
 
-/// Transparent.
+/// Creates a transparent bitmap.
 inline RefPtr<IMKBitmap> NewBitmap(IGLMsgQueue& queue, int width, int height,
                                    UseFrom from = UseFrom::AnyThread) {
     return NewBitmap(queue, width, height, nullptr, from);
 }
 
-/// Takes over the pixels of image. They are copied only if image does not own them, or if its rows are
-/// not tightly packed. Null, without a message, when image is.
+/// Creates a bitmap from an image and takes ownership of its pixels. They are copied only if image does not
+/// own them, or if its rows are not tightly packed. If image is null, returns null and logs nothing.
 inline RefPtr<IMKBitmap> NewBitmap(IGLMsgQueue& queue, std::unique_ptr<Bitmap> image,
                                    UseFrom from = UseFrom::AnyThread) {
     if (!image) return {};
@@ -69,44 +68,44 @@ inline RefPtr<IMKBitmap> NewBitmap(IGLMsgQueue& queue, std::unique_ptr<Bitmap> i
     return bitmap;
 }
 
-/// Over the host's default frame buffer, for instance a window's.
+/// Creates a bitmap that draws into the host's default frame buffer, for instance that of a window.
 inline RefPtr<IMKBitmap> NewScreenBitmap(IGLMsgQueue& queue, int width, int height,
                                          UseFrom from = UseFrom::AnyThread) {
     return RefPtr<IMKBitmap>::Adopt(
         MKGraphicsFactory::CreateScreenBitmap(&queue, 0, 0, width, height, 1, static_cast<int>(from)));
 }
 
-/// Another bitmap over the same image, which it keeps alive.
+/// Creates a bitmap that shares the image of parent, and keeps parent alive.
 inline RefPtr<IMKBitmap> NewSharedBitmap(IGLMsgQueue& queue, RefPtr<IMKBitmap> const& parent,
                                          UseFrom from = UseFrom::AnyThread) {
     return RefPtr<IMKBitmap>::Adopt(
         MKGraphicsFactory::CreateBitmap(&queue, parent.Get(), static_cast<int>(from)));
 }
 
-/// The canvas keeps target alive.
+/// Creates a canvas that draws into target and keeps it alive.
 inline RefPtr<IMKCanvas> NewCanvas(IGLMsgQueue& queue, IMKBitmap* target, UseFrom from = UseFrom::AnyThread) {
     return RefPtr<IMKCanvas>::Adopt(MKGraphicsFactory::CreateCanvas(&queue, target, static_cast<int>(from)));
 }
-/// The canvas keeps target alive.
+/// The same, for a reference-counted pointer.
 inline RefPtr<IMKCanvas> NewCanvas(IGLMsgQueue& queue, RefPtr<IMKBitmap> const& target,
                                    UseFrom from = UseFrom::AnyThread) {
     return NewCanvas(queue, target.Get(), from);
 }
 
-/// A canvas for external GL code. It keeps target alive.
+/// Creates a canvas for external GL code that draws into target, and keeps target alive.
 inline RefPtr<IMKPenCanvas> NewPenCanvas(IGLMsgQueue& queue, IMKBitmap* target,
                                          UseFrom from = UseFrom::AnyThread) {
     return RefPtr<IMKPenCanvas>::Adopt(
         MKGraphicsFactory::CreatePenCanvas(&queue, target, static_cast<int>(from)));
 }
-/// A canvas for external GL code. It keeps target alive.
+/// The same, for a reference-counted pointer.
 inline RefPtr<IMKPenCanvas> NewPenCanvas(IGLMsgQueue& queue, RefPtr<IMKBitmap> const& target,
                                          UseFrom from = UseFrom::AnyThread) {
     return NewPenCanvas(queue, target.Get(), from);
 }
 
-/// From a PNG, JPEG, WebP or mki file, by the base library's codecs, on this thread and also where Java has
-/// decoders. reason, if given, is set to the fault of the file.
+/// Loads a PNG, JPEG, WebP or mki file into a bitmap. The base library decodes it on the calling thread, even
+/// if Java has a decoder. If the file cannot be decoded, *reason is set, if it is given.
 inline RefPtr<IMKBitmap> LoadBitmap(IGLMsgQueue& queue, std::string const& path,
                                     std::string* reason = nullptr, UseFrom from = UseFrom::AnyThread) {
     String const name = String::FromFileName(path);
@@ -114,8 +113,8 @@ inline RefPtr<IMKBitmap> LoadBitmap(IGLMsgQueue& queue, std::string const& path,
     return NewBitmap(queue, std::move(image), from);
 }
 
-/// The bitmap's pixels, when everything that was posted before has been drawn. Null without memory, or if the
-/// queue refuses, for instance because it was stopped.
+/// Reads the bitmap's pixels, after waiting for everything that was posted before. Returns null if memory
+/// runs out, or if the queue refuses the task, for instance because it was stopped.
 inline std::unique_ptr<Bitmap> ReadBitmap(IMKBitmap& bitmap) {
     int const width = bitmap.GetWidth();
     int const height = bitmap.GetHeight();
@@ -125,7 +124,8 @@ inline std::unique_ptr<Bitmap> ReadBitmap(IMKBitmap& bitmap) {
     std::unique_ptr<Bitmap> image(new (std::nothrow) Bitmap);
     if (!pixels || !image) return nullptr;
     bitmap.GetBitmapData(bitmap.GetBitmapRect(), pixels.get());
-    // The reading has no result. A pixel that is read into its opposite and stays that has not been read.
+    // GetBitmapData does not report failure. So read one pixel again, over a different value: if that value
+    // is still there afterwards, nothing was read.
     unsigned char opposite[4];
     unsigned char probe[4];
     for (std::size_t i = 0; i < 4; ++i) opposite[i] = probe[i] = static_cast<unsigned char>(~pixels[i]);
@@ -137,8 +137,8 @@ inline std::unique_ptr<Bitmap> ReadBitmap(IMKBitmap& bitmap) {
     return image;
 }
 
-/// Into a file whose format its extension says; see BitmapFactory::SaveBitmap for quality. reason, if given,
-/// is filled with why it could not be saved.
+/// Saves the bitmap to a file, in the format of the path's extension. See BitmapFactory::SaveBitmap for
+/// quality. If it cannot be saved, *reason is set, if it is given.
 inline bool SaveBitmap(IMKBitmap& bitmap, std::string const& path, int quality = 100,
                        std::string* reason = nullptr) {
     std::unique_ptr<Bitmap> const image = ReadBitmap(bitmap);

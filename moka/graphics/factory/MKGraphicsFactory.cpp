@@ -31,7 +31,7 @@ IMKBitmap* MKGraphicsFactory::CreateBitmap(IGLMsgQueue* queue, Rect const& regio
     if (!detail::IsValidBitmap(queue, width, height)) return nullptr;
     Rect const clipped = region.Intersect(Rect(0, 0, width, height));
     if (clipped.IsEmpty()) return nullptr;
-    // useQueue decides who owns the pixels here, and the strips are always caller-side. Hosts call it so.
+    // Here useQueue selects the owner of the pixels, and the strips are always caller-side.
     return new (std::nothrow) MKTextureBitmap(queue, clipped, width, height, pixels, useQueue == 0, false);
 }
 
@@ -47,7 +47,7 @@ IMKBitmap* MKGraphicsFactory::CreateBitmap(IGLMsgQueue* queue, String const* pat
                                            int useQueue) {
     std::unique_ptr<Bitmap> const decoded(detail::DecodeFile(path, width, height));
     if (!decoded) return nullptr;
-    // The buffer passes to the texture bitmap. A request refused below loses it.
+    // The texture bitmap gets the buffer. If the request is refused below, the buffer leaks.
     decoded->SetDeleteBuffer(false);
     if (!detail::IsValidBitmap(queue, decoded->GetWidth(), decoded->GetHeight())) return nullptr;
     IMKBitmap* const bitmap = new (std::nothrow) MKTextureBitmap(
@@ -64,8 +64,8 @@ IMKBitmap* MKGraphicsFactory::CreateBitmap(IGLMsgQueue* queue, Rect const& regio
     IMKBitmap* const bitmap =
         CreateBitmap(queue, region, decoded->GetWidth(), decoded->GetHeight(), pixels, useQueue);
     if (!bitmap) return nullptr;
-    // The uploads are still to run, so the array is freed behind them: by the bitmap when it owns the pixels,
-    // else from here.
+    // The uploads have not run yet, so the array is freed by a task after them. If the bitmap owns the pixels
+    // it posts that task itself.
     decoded->SetDeleteBuffer(false);
     if (useQueue != 0) WorkerTask::PostDeleteArray(queue, pixels);
     return bitmap;

@@ -1,4 +1,4 @@
-// Decoding through com.velmora.android.sdk.pen.graphics.MokaBitmapFactory.
+// Decodes images by calling com.velmora.android.sdk.pen.graphics.MokaBitmapFactory.
 #include "moka/base/Bitmap.h"
 #include "moka/base/BitmapFactory.h"
 #include "moka/base/Log.h"
@@ -13,7 +13,8 @@
 namespace Moka {
 namespace {
 
-// Written while loading, only read afterwards, and by nobody before SetJavaDecoder. Never given back.
+// MKBitmapFactory_OnLoad writes these before it calls SetJavaDecoder. Afterwards they are only read. The
+// global references are never released.
 JavaVM* gJavaVM = nullptr;
 jclass gBitmapFactoryClass = nullptr;
 jmethodID gDecodeFile = nullptr;
@@ -21,10 +22,11 @@ jmethodID gRecycle = nullptr;
 
 void LogError(char const* text) { __android_log_print(ANDROID_LOG_ERROR, "mok_log", "%s", text); }
 
-// Left pending, an exception would spoil every later call on a thread that goes on, the loader's above all.
+// A pending exception would make every later JNI call on this thread fail, in particular on the loader's
+// thread.
 bool ClearException(JNIEnv* env) {
     if (!env->ExceptionCheck()) return false;
-    // What Java prints may name the file.
+    // The stack trace may contain the path of the file, so it is printed in engineering builds only.
     if (System::IsBuildTypeEngMode()) env->ExceptionDescribe();
     env->ExceptionClear();
     return true;
@@ -50,7 +52,7 @@ void Recycle(JNIEnv* env, jobject javaBitmap) {
     if (ClearException(env)) LogError("MKBitmapFactory : recycle threw an exception");
 }
 
-// The pixels go on as they are, into a bitmap of the base library's making.
+// Moves the pixels into a bitmap that the base library creates.
 Bitmap* TakePixels(Bitmap* converted) {
     Bitmap* const bitmap = BitmapFactory::CreateBitmapFromBuffer(
         converted->GetBuffer(), converted->GetWidth(), converted->GetHeight(), converted->GetWidth() * 4,
@@ -59,7 +61,7 @@ Bitmap* TakePixels(Bitmap* converted) {
     return bitmap;
 }
 
-// Ends the local reference, which on a thread of Java's own nobody else would.
+// Deletes the local reference, because on a Java thread it would live until the native method returns.
 Bitmap* Convert(JNIEnv* env, jobject javaBitmap) {
     Bitmap converted;
     bool const isConverted = JNI_ConvertJavaToBitmap(env, javaBitmap, &converted, false);
@@ -86,7 +88,7 @@ Bitmap* DecodeThroughJava(String const* path, int width, int height) {
     JNIAutoThread const thread(gJavaVM);
     JNIEnv* const env = thread.GetEnv();
     jobject const javaBitmap = env ? CallDecodeFile(env, *path, width, height) : nullptr;
-    // Java may know fewer formats than the base library, which decodes at the file's own size.
+    // The base library may know a format that Java does not know. It decodes in the file's own size.
     if (!javaBitmap) return BitmapFactory::CreateBitmapForGraphics(path);
     return Convert(env, javaBitmap);
 }
@@ -133,7 +135,7 @@ int MKBitmapFactory_OnLoad(JavaVM* vm, JNIEnv* env) {
     __android_log_print(ANDROID_LOG_INFO, "mok_log", "MKBitmapFactory JNI_OnLoad enter!!");
     gJavaVM = vm;
     bool const isComplete = FindBitmapFactory(env) && FindBitmap(env);
-    // Half a success decodes as well.
+    // Decoding needs the VM and the method only, even if another look-up failed.
     detail::SetJavaDecoder(gJavaVM && gDecodeFile ? &DecodeThroughJava : nullptr);
     if (!isComplete) return 0;
     __android_log_print(ANDROID_LOG_INFO, "mok_log", "MKBitmapFactory JNI_OnLoad Success");

@@ -1,4 +1,4 @@
-// The natives of com.velmora.android.sdk.pen.graphics.MokaBitmapLoader.
+// The native methods of com.velmora.android.sdk.pen.graphics.MokaBitmapLoader.
 #include "moka/base/log/AndroidLog.h"
 #include "moka/graphics/jni/OnLoad.h"
 #include "moka/graphics/loader/MKBitmapLoader.h"
@@ -8,12 +8,12 @@ namespace {
 
 constexpr char const* kOnLoadName = "void BitmapLoader_OnLoad(JavaVM *, JNIEnv *)";
 
-// The same text on every compiler: log readers look for it.
+// A fixed text, not __PRETTY_FUNCTION__, because log filters search for it.
 constexpr char const* kStartEventLoopName =
     "static void Moka::BitmapLoaderGlue::Native_startEventLoop(JNIEnv *, jclass)";
 
 struct BitmapLoaderGlue {
-    // Java's thread never comes back from here: it is the loader's until the process ends.
+    // The calling Java thread becomes the loader's thread and never returns.
     static void Native_startEventLoop(JNIEnv*, jclass) {
         __android_log_print(ANDROID_LOG_INFO, "mok_log", "BitmapLoader %s", kStartEventLoopName);
         MKBitmapLoader::startEventLoop();
@@ -46,7 +46,7 @@ void BitmapLoader_OnLoad(JavaVM*, JNIEnv* env) {
                             kOnLoadName);
         return;
     }
-    // The thread that it starts is what matters; the object is nobody's.
+    // The constructor starts the loader's thread. The object itself is not needed.
     if (jmethodID const init = env->GetMethodID(type, "<init>", "()V")) env->NewObject(type, init);
     env->DeleteLocalRef(type);
     __android_log_print(ANDROID_LOG_INFO, "mok_log", "BitmapLoader %s JNI_OnLoad Success!", kOnLoadName);

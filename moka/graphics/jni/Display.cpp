@@ -36,7 +36,7 @@ Display::~Display() = default;
 
 void Display::Copy(Display const* source) {
     if (!source) return;
-    // Through the virtual getters, in this order: a source may compute what it says.
+    // Calls the virtual getters, in this order, because a derived class may compute the values.
     mWidthPixels = source->GetWidthPixels();
     mHeightPixels = source->GetHeightPixels();
     mSystemDensity = source->GetSystemDensity();

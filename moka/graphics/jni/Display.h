@@ -1,4 +1,4 @@
-/// Display: the record behind a Java MokaDisplay, whose handle is this object's address.
+/// Display: the native part of a Java MokaDisplay, which holds this object's address as its handle.
 /// Owner:  the creator; a Java MokaDisplay owns the one that it created.
 /// Thread: not synchronised.
 #pragma once

@@ -1,4 +1,4 @@
-// The natives of com.velmora.android.sdk.pen.view.MokaDisplay.
+// The native methods of com.velmora.android.sdk.pen.view.MokaDisplay.
 #include "moka/base/log/InfoLog.h"
 #include "moka/graphics/jni/Display.h"
 #include "moka/graphics/jni/OnLoad.h"
@@ -12,7 +12,7 @@ namespace {
 
 constexpr InfoLog LogInfo{"DisplayGlue"};
 
-// A handle is the object's address. But for Native_finalize, Java never passes 0.
+// A handle is the object's address. Java passes 0 to Native_finalize only.
 struct DisplayGlue {
     static Display* FromHandle(jlong handle) {
         return reinterpret_cast<Display*>(static_cast<std::intptr_t>(handle));
@@ -65,7 +65,7 @@ void Display_OnLoad(JavaVM* vm) {
     using Moka::LogInfo;
     LogInfo("Display JNI_OnLoad enter!!");
     void* found = nullptr;
-    // An older version than JNI_OnLoad asks for, on purpose: these natives need no more.
+    // These methods need only version 1.2, which is older than the one that JNI_OnLoad requests.
     if (vm->GetEnv(&found, JNI_VERSION_1_2) != JNI_OK) return LogInfo("Display : Cannot find env");
     auto* const env = static_cast<JNIEnv*>(found);
     jclass const type = env->FindClass("com/velmora/android/sdk/pen/view/MokaDisplay");

@@ -1,12 +1,12 @@
-/// IDisplay: the device's screen as the Java side describes it, for native code to read. Sizes are in pixels,
-/// densities are factors unless named dpi. The vtable order is ABI.
+/// IDisplay: gives native code the properties of the screen that Java has set. Sizes are in pixels. Densities
+/// are factors, except those named dpi. The vtable order is ABI.
 #pragma once
 
 namespace Moka {
 
 class IDisplay {
 public:
-    /// Numbers from Java, unchanged; Java defines their meaning.
+    /// Numbers from Java. Java defines their meaning.
     enum class LayoutDirection : int {};
     enum class Orientation : int {};
     enum class ScreenOrientation : int {};
@@ -29,7 +29,7 @@ public:
     virtual LayoutDirection GetLayoutDirection() const = 0;
     virtual Orientation GetOrientation() const = 0;
     virtual ScreenOrientation GetScreenOrientation() const = 0;
-    /// Whether the shorter side of the application's area is at least 512 at density 1.
+    /// True if the shorter side of the application's area, divided by the system density, is at least 512.
     virtual bool IsTabletUX() const = 0;
     virtual bool IsTablet() const = 0;
     virtual bool IsUWP() const = 0;

@@ -14,7 +14,7 @@ jint JNI_OnLoad(JavaVM* vm, void*) {
         __android_log_print(ANDROID_LOG_ERROR, "mok_log", "JNI_VERSION is different");
         return 0;
     }
-    // An exception that one of them leaves is Java's to throw, out of the call that loads the library.
+    // If one of them leaves an exception pending, Java throws it from System.loadLibrary.
     Display_OnLoad(vm);
     BitmapLoader_OnLoad(vm, static_cast<JNIEnv*>(env));
     __android_log_print(ANDROID_LOG_INFO, "mok_log", "Graphics JNI_OnLoad Success");

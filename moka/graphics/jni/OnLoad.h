@@ -1,9 +1,9 @@
-/// OnLoad.h: where Java and its host enter the library. Java calls JNI_OnLoad when it loads the library,
-/// which registers the natives of MokaDisplay and MokaBitmapLoader. Nobody but the host calls
-/// MKBitmapFactory_OnLoad.
-/// Thread: the one that loads, before anything else of the library is used.
-/// Fails:  missing classes and methods are logged. JNI_OnLoad and the two it calls leave Java's exception
-///         pending: it comes out of System.loadLibrary.
+/// OnLoad.h: the entry points for Java. When Java loads the library it calls JNI_OnLoad, which registers the
+/// native methods of MokaDisplay and MokaBitmapLoader. The library does not call MKBitmapFactory_OnLoad; the
+/// host does.
+/// Thread: the thread that loads the library, before any other use of it.
+/// Fails:  logs missing classes and methods. JNI_OnLoad and the two functions that it calls leave Java's
+///         exception pending, so System.loadLibrary throws it.
 #pragma once
 
 #include "moka/base/Export.h"
@@ -12,18 +12,19 @@
 
 extern "C" {
 
-/// The version of JNI that is needed, or 0, which Java takes for a failure.
+/// Returns the required version of JNI, or 0, which Java treats as a failure.
 JNIEXPORT jint JNICALL JNI_OnLoad(JavaVM* vm, void* reserved);
 
-/// Registers the natives of MokaDisplay.
+/// Registers the native methods of MokaDisplay.
 MOKA_API void Display_OnLoad(JavaVM* vm);
 
-/// Also creates one MokaBitmapLoader, whose thread becomes the loader's.
+/// Registers the native methods of MokaBitmapLoader, and creates one such object, whose thread becomes the
+/// loader's.
 MOKA_API void BitmapLoader_OnLoad(JavaVM* vm, JNIEnv* env);
 
-/// From now on files other than "mki" are decoded by MokaBitmapFactory.decodeFile. To be called once, from a
-/// native method or a JNI_OnLoad whose class loader knows that class and android.graphics.Bitmap. 1, or 0
-/// when either class is missing; no exception stays pending. Without Bitmap files are decoded all the same,
-/// and Java's bitmaps are left to the garbage collector instead of being recycled.
+/// Makes MokaBitmapFactory.decodeFile decode all files other than "mki". Call it once, from a native method
+/// or a JNI_OnLoad whose class loader finds that class and android.graphics.Bitmap. Returns 1, or 0 if one of
+/// the classes is missing. No exception stays pending. If only Bitmap is missing, files are decoded
+/// nevertheless, and Java's bitmaps are not recycled but left to the garbage collector.
 MOKA_API int MKBitmapFactory_OnLoad(JavaVM* vm, JNIEnv* env);
 }

@@ -21,13 +21,13 @@ constexpr int kMaxLoggedPathBytes = 500;
 
 thread_local bool isLoaderThread = false;
 
-// Codecs run out of memory, and listeners are not ours: what either throws must not end the loop.
+// Exceptions of codecs (out of memory) and of listeners must not end the loop.
 template <class Function>
 void Guard(char const* who, Function const& function) {
     RunGuarded(kLoaderTag, who, function);
 }
 
-// CPU loads are decoded by the base library, whatever the platform offers for the others.
+// The base library decodes CPU loads on every platform.
 Bitmap* DecodeForCpu(Request const& load) {
     if (load.loadWidth == 0 || load.loadHeight == 0)
         return BitmapFactory::CreateBitmapForGraphics(&load.path);
@@ -44,7 +44,7 @@ std::unique_ptr<Bitmap> Decode(Request const& load) {
     return bitmap;
 }
 
-// The pixels pass to the result, if there is one.
+// Creates the GPU bitmap, which takes ownership of the pixels if it could be created.
 IMKBitmap* Upload(Request const& load, Bitmap* decoded) {
     constexpr char const* kWhat = "BitmapLoaderImpl::LoadBitmap (CreateScaledCPUBitmap)";
     if (!decoded) {
@@ -66,8 +66,8 @@ IMKBitmap* Upload(Request const& load, Bitmap* decoded) {
 void ReleaseResult(Bitmap*) {}
 void ReleaseResult(IMKBitmap* bitmap) { MKGraphicsFactory::ReleaseBitmap(bitmap); }
 
-// The closing line has a condition of its own: a GPU bitmap that could not be made is "OnLoad" there. Relied
-// upon.
+// The closing log line says "OnLoad" if the file was decoded, even if the GPU bitmap could not be created.
+// Log filters search for these lines.
 template <class Result>
 void Report(Request const& load, Result* result, bool wasDecoded) {
     if (!load.listener) return;
@@ -97,8 +97,8 @@ void Report(Request const& save, bool saved) {
     Guard("OnCallbackCompleted", [&] { save.listener->OnCallbackCompleted(); });
 }
 
-// The listener may go on using the bitmap until the render thread has caught up. Where no render thread takes
-// it, it stays for good, as everything does whose deletion is refused; unless nobody ever saw it.
+// Posts the deletion of the bitmap, because the listener may use it until the render thread has caught up. If
+// the queue refuses, the bitmap stays alive for its receiver. Without a listener it is deleted here.
 void Discard(Request const& load, std::unique_ptr<Bitmap> decoded) {
     if (!decoded) return;
     bool const isTaken = load.msgQueue && WorkerTask::PostDelete(load.msgQueue, decoded.get());
@@ -106,7 +106,7 @@ void Discard(Request const& load, std::unique_ptr<Bitmap> decoded) {
 }
 
 bool Encode(Request const& save) {
-    // A row too wide for any image gets a stride that is refused, instead of one that overflows.
+    // For a width above the limit, use a stride that is refused, because the product might overflow.
     int const stride = save.width <= BitmapFactory::kMaxSide ? save.width * 4 : 0;
     Bitmap bitmap;
     if (!bitmap.Construct(save.buffer.get(), save.width, save.height, stride, Bitmap::kFormatRgba8888, false,
@@ -132,8 +132,8 @@ void BitmapLoaderImpl::EventLoop(void* loader) {
     }
 }
 
-// The head stays in the queue, as the sign that the request was not cancelled; what it takes to process it
-// goes along.
+// Waits for a request and returns its contents. The emptied head stays in the queue, to show that the request
+// was not cancelled.
 Request BitmapLoaderImpl::AwaitRequest() {
     AutoCriticalSection const lock(*mLock);
     while (GetQueueSize() == 0) {
@@ -172,7 +172,7 @@ void BitmapLoaderImpl::LoadBitmap(Request& request) {
     } else {
         IMKBitmap* bitmap = nullptr;
         {
-            // Cancelled or delivered: nobody may come in between.
+            // Confirming and uploading is one step: a load is either cancelled or delivered.
             AutoCriticalSection const lock(*mLock);
             ConfirmLoad(request);
             if (request.listener) bitmap = Upload(request, decoded.get());
@@ -185,7 +185,7 @@ void BitmapLoaderImpl::LoadBitmap(Request& request) {
     mLoadDoneCondition->Signal();
 }
 
-// Takes the request out of the queue, or finds that it was cancelled: then nobody is called back.
+// Removes the request from the queue. If it was cancelled, clears its listener, so that nobody is called.
 void BitmapLoaderImpl::ConfirmLoad(Request& request) {
     AutoCriticalSection const lock(*mLock);
     Request const* const head = mQueue ? mQueue->GetHead() : nullptr;
@@ -209,8 +209,8 @@ void BitmapLoaderImpl::SaveBitmap(Request& request) {
     mSaveDoneCondition->Signal();
 }
 
-// Takes the request out of the queue. Its listener may have gone meanwhile; the request itself is never
-// cancelled, so the head is known to be it.
+// Removes the request from the queue. It is the head, because saves are never cancelled. Its listener may
+// have been removed in the meantime.
 void BitmapLoaderImpl::ConfirmSave(Request& request) {
     AutoCriticalSection const lock(*mLock);
     RequestList const head = mQueue ? mQueue->TakeHead() : RequestList();

@@ -10,7 +10,7 @@
 namespace Moka::detail {
 namespace {
 
-// Ahead of the interface's own threads, which wait for its pictures.
+// Above the priority of user interface threads, because they wait for the images.
 constexpr int kThreadPriority = -9;
 
 std::size_t GetBufferSize(IMKBitmap const& bitmap) {
@@ -18,8 +18,8 @@ std::size_t GetBufferSize(IMKBitmap const& bitmap) {
     return static_cast<std::size_t>(bitmap.GetWidth()) * static_cast<std::size_t>(bitmap.GetHeight()) * 4;
 }
 
-// Cleared, because a bitmap that covers only a part of its rectangle leaves the rest as it is, and no memory
-// of ours may end up in a file.
+// Cleared, because a bitmap of a region does not write the rest of its rectangle, and old memory must not get
+// into a file.
 unsigned char* AllocateCleared(std::size_t size) {
     return size > 0 ? new (std::nothrow) unsigned char[size]() : nullptr;
 }
@@ -31,8 +31,8 @@ BitmapLoaderImpl& BitmapLoaderImpl::GetInstance() {
     return instance;
 }
 
-// The loop may sleep on the conditions, or be in the middle of a request, until the process is gone; so it
-// finds everything but the queue.
+// At process exit the loop may still wait on the conditions or process a request. So only the queue is
+// destroyed.
 BitmapLoaderImpl::~BitmapLoaderImpl() {
     AutoCriticalSection const lock(*mLock);
     mQueue.reset();
@@ -66,7 +66,8 @@ bool BitmapLoaderImpl::RequestSave(BitmapLoaderInterface* listener, int id, Stri
 
     AutoCriticalSection const lock(*mLock);
     mPendingSaveRequestList->splice(mPendingSaveRequestList->end(), save);
-    // On the render thread itself the pixels may be here, and the request gone, before this returns.
+    // If this runs on the render thread, the callback may run, and delete the request, before the call
+    // returns.
     bitmap.GetBitmapDataAsync(Rect(0, 0, request.width, request.height), request.buffer.get(), &request,
                               SaveBitmapCB);
     return true;
@@ -89,7 +90,7 @@ bool BitmapLoaderImpl::RequestSave(BitmapLoaderInterface* listener, int id, Stri
     return false;
 }
 
-// On the render thread.
+// Runs on the render thread.
 void BitmapLoaderImpl::SaveBitmapCB(Rect const&, void*, void* request) {
     BitmapLoaderImpl& self = GetInstance();
     AutoCriticalSection const lock(*self.mLock);

@@ -1,12 +1,14 @@
-// BitmapLoaderImpl: the engine behind the loaders: one queue of requests and the loop that decodes and
-// encodes them, one after the other, away from everybody's thread.
-// Owner:   the process. Its end drops what is queued and lets the loop sleep on; nothing is joined.
-// Thread:  requests, cancels and waits from any but the loop's own, which may not wait for itself. All
-//          callbacks come on the loop's thread.
-// Locks:   one recursive lock guards everything. It is held while tasks are posted and taken again inside a
-//          render-thread task; a listener's lock is taken inside it. So: no queue may hold a lock of its own
-//          while it runs or frees a task, and nobody calls the loader with a listener's lock held.
-// Fails:   requests are refused when memory runs out; nothing throws.
+// BitmapLoaderImpl: the common part of all loaders: one queue of requests, and a loop that decodes and
+// encodes them one after the other on its own thread.
+// Owner:   one static object for the process. At process exit queued requests are dropped; the loop's thread
+//          is not joined.
+// Thread:  requests, cancels and waits on any thread except the loop's, which would wait for itself.
+//          Callbacks run on the loop's thread.
+// Locks:   one recursive lock guards everything. It is held while tasks are posted, and a task on the render
+// thread
+//          locks it. A listener's lock is locked inside it. So a queue must not hold its own lock while it
+//          runs or frees a task, and nobody may call the loader while holding a listener's lock.
+// Fails:   refuses requests if memory runs out; nothing throws.
 #pragma once
 
 #include "moka/base/ConditionalVariable.h"
@@ -31,37 +33,38 @@ class BitmapLoaderImpl : NonAssignable {
 public:
     static BitmapLoaderImpl& GetInstance();
 
-    // False also for a null listener, and while a load of this listener and id is queued or processed.
+    // Returns false if memory runs out, if listener is null, or while a load of this listener and id is
+    // queued or processed.
     bool RequestLoad(BitmapLoaderInterface* listener, int id, String const& path, BitmapType type,
                      IGLMsgQueue* queue, int width, int height);
 
-    // Reads the bitmap back first. A read-back that the bitmap's queue refuses stays pending for ever. False
-    // also for an empty bitmap.
+    // Reads the bitmap back first. If the bitmap's queue refuses that, the request stays pending for ever.
+    // Returns false if memory runs out or the bitmap is empty.
     bool RequestSave(BitmapLoaderInterface* listener, int id, String const& path, IMKBitmap& bitmap,
                      void* userData, int quality);
-    // Owns the pixels from here on, unless it returns false: RGBA8, rows packed, `new unsigned char[]`. False
-    // also for a null buffer.
+    // Takes ownership of the pixels: RGBA8, rows packed, from `new unsigned char[]`. Returns false, and does
+    // not take ownership, if memory runs out or buffer is null.
     bool RequestSave(BitmapLoaderInterface* listener, int id, String const& path, unsigned char* buffer,
                      int width, int height, void* userData, int quality);
 
-    // A load that is being decoded is cancelled too: its result is dropped, and nobody is called back.
+    // Cancel loads, including one that is being decoded: its result is dropped, and nobody is called.
     void CancelLoadRequest(BitmapLoaderInterface* listener, int id);
     void CancelAllLoadRequest(BitmapLoaderInterface* listener);
-    // Saves of this listener, queued or being read back, still write their files but call nobody.
+    // Makes queued and pending saves of this listener call nobody. They still write their files.
     void RemoveAllSaveCallback(BitmapLoaderInterface* listener);
 
-    // While a load is being processed, its callbacks included.
+    // Waits while a load is being processed, including its callbacks.
     void WaitUntilMsgQueueRequired();
-    // While a save is being read back, queued or processed, or anything else is queued.
+    // Waits while a save is being read back or processed, or any request is queued.
     void WaitForAllSaveRequestsToEnd();
 
-    // The loop, on the calling thread. The loader's own thread is the alternative: nothing keeps two loops
-    // from running, but they would process each request twice.
+    // Runs the loop on the calling thread. Do not start a second loop, here or with EventLoopBySelf: this is
+    // not checked, and each request would be processed twice.
     [[noreturn]] static void EventLoop(void* loader);
-    // Starts the loop on a thread of the loader's own, once. False when there is no such thread to be had.
+    // Starts the loop on a thread of the loader, once. Returns false if the system cannot create a thread.
     static bool EventLoopBySelf(void* loader);
 
-    // On the thread that calls back. Waiting for the loader there would never end.
+    // True on the thread that calls back. Waiting for the loader on that thread would never end.
     static bool IsLoaderThread();
 
 private:
@@ -83,9 +86,9 @@ private:
     NeverDestroyed<CriticalSection> mLock{true};
     NeverDestroyed<ConditionalVariable> mQueueCondition;    // a request was queued
     NeverDestroyed<ConditionalVariable> mLoadDoneCondition; // a load was processed
-    NeverDestroyed<ConditionalVariable> mSaveDoneCondition; // a save was, or the queue ran empty
-    std::optional<RequestQueue> mQueue{std::in_place};      // nothing once the process ends
-    NeverDestroyed<RequestList> mPendingSaveRequestList;    // their pixels are being read back
+    NeverDestroyed<ConditionalVariable> mSaveDoneCondition; // a save was processed, or the queue is empty
+    std::optional<RequestQueue> mQueue{std::in_place};      // empty after the destructor
+    NeverDestroyed<RequestList> mPendingSaveRequestList;    // saves whose pixels are being read back
     Thread* mThread = nullptr;                              // never deleted
     unsigned mRequestCount = 0;
     bool mLoadTaskRunning = false;

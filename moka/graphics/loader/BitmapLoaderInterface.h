@@ -1,10 +1,10 @@
 /// BitmapLoaderInterface: receives the results of loads and saves.
-/// Owner:  the implementer; the loader keeps a plain pointer until the request is over.
-/// Thread: everything is called on the loader's thread. OnCallbackPending comes first, inside the loader's
-///         lock: it must not wait for anything that another thread does with the loader. Then one result,
-///         then OnCallbackCompleted, both with no lock held. After OnCallbackCompleted nothing touches the
+/// Owner:  the implementer. The loader keeps a raw pointer until the request is completed.
+/// Thread: the loader's thread calls all functions. OnCallbackPending comes first, with the loader's lock
+///         held: it must not wait for another thread that uses the loader. Then come one result and
+///         OnCallbackCompleted, without a lock. After OnCallbackCompleted the loader does not use the
 ///         listener.
-/// Fails:  an exception of an operation is logged as an error; the rest of the sequence is still called.
+/// Fails:  exceptions of a function are logged as errors; the remaining functions are still called.
 #pragma once
 
 #include "moka/base/Export.h"
@@ -19,16 +19,18 @@ class String;
 
 class MOKA_API BitmapLoaderInterface {
 public:
-    /// A CPU bitmap stays valid until the render thread has run what is posted to the request's queue now; a
-    /// GPU bitmap until the call returns, unless the listener takes a reference of its own.
+    /// Loading succeeded. A CPU bitmap stays valid until the render thread has run the tasks that are posted
+    /// to the request's queue during this call. A GPU bitmap stays valid until the call returns; take a
+    /// reference to keep it.
     virtual void OnLoad(int id, String const& path, Bitmap& bitmap);
     virtual void OnLoad(int id, String const& path, IMKBitmap& bitmap);
 
-    /// For listeners that deliver lists; the loader itself never calls them.
+    /// For listeners that pass on lists. The loader never calls these.
     virtual void OnLoadList(int id, String const& path, std::vector<Bitmap*>& bitmaps);
     virtual void OnLoadList(int id, String const& path, std::vector<IMKBitmap*>& bitmaps);
 
-    /// One call for each request: loading failed, saving succeeded, or saving failed.
+    /// Loading failed, saving succeeded, saving failed. The loader calls one of OnLoad and these for each
+    /// request.
     virtual void OnLoadError(int id, String const& path) = 0;
     virtual void OnSave(int id, String const& path, void* userData) = 0;
     virtual void OnSaveError(int id, String const& path, void* userData) = 0;

@@ -1,4 +1,4 @@
-// FrontEndText: what the two front ends log, and in what they differ.
+// FrontEndText: the log texts of the two front ends, and their differences.
 #pragma once
 
 #include "moka/graphics/loader/Request.h"
@@ -10,7 +10,8 @@ class IMKBitmap;
 
 namespace detail {
 
-// By the kind of bitmap: its name in a request, and the class's, which is also its log tag.
+// For each kind of bitmap: its type in a request, and the class name of its front end, which is also the log
+// tag.
 template <class BitmapT>
 struct FrontEndKind;
 
@@ -26,8 +27,8 @@ struct FrontEndKind<Bitmap> {
     static constexpr char const* kClass = "BitmapLoader";
 };
 
-// Each text begins with the class, the front end's address and its name. Those that end in Path show the path,
-// in engineering builds.
+// The formats of the log lines. Each begins with the class, the front end's address and its name. Those whose
+// constants end in Path contain the path and are used in engineering builds.
 namespace FrontEndText {
 constexpr char const* kDestructor = "%s[%p:%s] ~%s";
 constexpr char const* kRequestLoad = "%s[%p:%s] RequestLoad(%d) ret %s";

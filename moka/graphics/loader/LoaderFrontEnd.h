@@ -1,17 +1,17 @@
-/// LoaderFrontEnd: the common part of MKBitmapLoader and BitmapLoader. A front end asks for loads and saves
-/// under numbers of the caller's choice and hands the results to the functions it was given.
-/// Owner:   the caller; any number of them, all served by the one loader of the process, in the order of the
-///          requests.
-/// Thread:  requests, cancels, waits and destruction from any; the functions run on the loader's thread, with
-///          no lock held. They may request, cancel and destroy other front ends. They may not wait, nor
-///          destroy the front end that is calling.
-/// Loop:    start it once in a process, by one of the two ways, which are alternatives. Requests made before
-///          wait for it.
-/// Results: each request that was accepted, and not cancelled, calls back once. An exception out of a
-///          function is one error line.
+/// LoaderFrontEnd: the common part of MKBitmapLoader and BitmapLoader. A front end requests loads and saves,
+/// identified by numbers that the caller chooses, and passes the results to callback functions.
+/// Owner:   the caller. There may be any number of front ends. The one loader of the process handles all
+///          requests in order.
+/// Thread:  requests, cancels, waits and destruction on any thread. The callback functions run on the
+///          loader's thread, without a lock. They may request, cancel, and destroy other front ends. They
+///          must not wait, and must not destroy their own front end.
+/// Loop:    start the loader once in a process, with startEventLoop or startEventLoopBySelf. Earlier requests
+/// wait. Results: each request that was accepted and not cancelled calls back once. An exception of a
+/// callback function is
+///          logged as an error.
 /// Units:   sizes in pixels; RGBA8, premultiplied.
-/// Fails:   a refused request is false and calls nobody; a file that cannot be read or written is onLoadError
-///          or onSaveError.
+/// Fails:   a refused request returns false and calls nobody. If a file cannot be read or written,
+///          onLoadError or onSaveError is called.
 #pragma once
 
 #include "moka/base/ConditionalVariable.h"
@@ -32,7 +32,7 @@ namespace detail {
 template <class BitmapT>
 class LoaderFrontEnd : public BitmapLoaderInterface, NonAssignable {
 public:
-    /// Each may be empty. path is the one of the request.
+    /// The callback functions. Each may be empty. path is that of the request.
     struct Callback {
         /// A loaded bitmap.
         std::function<void(int id, String const& path, BitmapT& bitmap)> onLoad;
@@ -46,40 +46,42 @@ public:
         std::function<void(int id, String const& path, void* userData)> onSaveError;
     };
 
-    /// False while a load of this id is waiting or being decoded, and when memory runs out. Without a size,
-    /// or when one side is 0, the file's own. queue is where the result goes.
+    /// Requests a load, in the file's own size, or scaled to width x height if neither is 0. A GPU bitmap is
+    /// created on queue; the deletion of a CPU bitmap is posted to it. Returns false while a load of this id
+    /// is waiting or being decoded, and if memory runs out.
     bool RequestLoad(int id, String const& path, IGLMsgQueue* queue);
     bool RequestLoad(int id, String const& path, IGLMsgQueue* queue, int width, int height);
 
-    /// A load that waits or is being decoded never calls back; its id is free again. One whose
-    /// OnCallbackPending was called still calls back: after a cancel, WaitForCallback() returns when that is
-    /// over.
+    /// Cancel one load, or all of this front end. A load that waits or is being decoded never calls back, and
+    /// its id can be used again. If OnCallbackPending was called already, the load still calls back;
+    /// WaitForCallback() then waits until that is over.
     void CancelLoadRequest(int id);
     void CancelAllLoadRequest();
 
-    /// Saves pixels, rows packed, in a `new unsigned char[]` that belongs to the loader from here on. The
-    /// path's extension chooses the format; quality is the encoder's, 0 ... 100. False, with the buffer still
-    /// the caller's, when it is null or memory runs out.
+    /// Saves pixels, rows packed, and takes ownership of buffer, which must come from `new unsigned char[]`.
+    /// The path's extension selects the format; quality is that of the encoder, 0 ... 100. Returns false, and
+    /// does not take ownership, if buffer is null or memory runs out.
     bool RequestSave(int id, String const& path, unsigned char* buffer, int width, int height, void* userData,
                      int quality);
 
-    /// Makes the calling thread the loader's.
+    /// Makes the calling thread the loader's thread. Never returns.
     [[noreturn]] static void startEventLoop();
-    /// Starts the loader's own thread; further calls return true. False if the system has no more threads.
+    /// Starts the loader's thread; further calls do nothing and return true. Returns false if the system
+    /// cannot create a thread.
     static bool startEventLoopBySelf();
 
-    /// Returns when no load is being processed.
+    /// Waits until no load is being processed.
     static void WaitUntilMsgQueueRequired();
-    /// Returns when every file has been written; loads that are queued are waited for as well. queue is the
-    /// one of the bitmaps that are being saved, or null. Never from the render thread.
+    /// Waits until all files are written and all queued loads are done. queue is that of the saved bitmaps,
+    /// or null. Do not call it on the render thread.
     static void WaitForAllSaveRequestsToEnd(IGLMsgQueue* queue);
-    /// Returns when none of this front end's functions is running.
+    /// Waits until none of this front end's callback functions is running.
     void WaitForCallback();
 
-    /// As BitmapLoaderInterface.
+    /// See BitmapLoaderInterface.
     using BitmapLoaderInterface::OnLoad;
     using BitmapLoaderInterface::OnLoadList;
-    /// Call the function of the same name.
+    /// Call the callback function of the same name.
     void OnLoad(int id, String const& path, BitmapT& bitmap) override;
     void OnLoadList(int id, String const& path, std::vector<BitmapT*>& bitmaps) override;
     void OnLoadError(int id, String const& path) override;
@@ -93,22 +95,22 @@ protected:
     LoaderFrontEnd(char const* name, Callback* callback);
     ~LoaderFrontEnd() override = default;
 
-    /// First in the destructor of the class that is called back: drops the loads, lets the saves go on
-    /// without it, and waits for a function that is running.
+    /// Drops the loads, makes the saves call nobody, and waits for a running callback function. Derived
+    /// classes call it first in their destructors.
     void Detach();
 
-    /// Logs and returns what became of a save; source is the bitmap, or the buffer.
+    /// Logs a save request and returns isAccepted. source is the bitmap or the buffer.
     bool LogSave(String const& path, void const* source, bool isAccepted) const;
 
 private:
     template <class... Values>
     void Print(char const* format, Values... values) const;
 
-    char const* const mName; // the caller's; null silences the lines that would carry it
+    char const* const mName; // owned by the caller; if it is null, the lines that contain it are not logged
     Callback mCallback;
     CriticalSection mLock{true}; // guards mCallbackPending
     ConditionalVariable mCondition;
-    bool mCallbackPending = false; // the loader's thread is between pending and completed
+    bool mCallbackPending = false; // true from OnCallbackPending to OnCallbackCompleted
 };
 
 } // namespace detail

@@ -1,4 +1,4 @@
-// LoaderLog.h: the log lines of the loader itself.
+// LoaderLog.h: the log tag of the loader, and a function for its information lines.
 #pragma once
 
 #include "moka/base/log/InfoLog.h"

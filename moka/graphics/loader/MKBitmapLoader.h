@@ -1,8 +1,8 @@
-/// MKBitmapLoader: loads image files into GPU bitmaps, and saves GPU bitmaps and pixels into image files,
-/// without making the caller wait. See LoaderFrontEnd.h for requests, callbacks and threads. A loaded bitmap
-/// is made on the queue of its request, which must not be null then; the loader releases it after onLoad:
-/// to keep it, take a reference. Destruction drops this loader's loads; its saves still write their
-/// files but call nobody. It waits for a function of this loader that is running, not for a decode.
+/// MKBitmapLoader: loads image files into GPU bitmaps, and saves GPU bitmaps and pixels to image files, in
+/// the background. See LoaderFrontEnd.h for requests, callbacks and threads. A loaded bitmap is created on
+/// the queue of its request, which must not be null. The loader releases it after onLoad; take a reference to
+/// keep it. The destructor drops this loader's loads; its saves still write their files but call nobody. It
+/// waits for a running callback of this loader, not for a decode.
 #pragma once
 
 #include "moka/base/Export.h"
@@ -14,12 +14,12 @@ extern template class MOKA_API detail::LoaderFrontEnd<IMKBitmap>;
 
 class MOKA_API MKBitmapLoader : public detail::LoaderFrontEnd<IMKBitmap> {
 public:
-    /// name appears in log lines, is not copied and may be null. callback is copied and may be null.
+    /// name appears in log lines. It is not copied and may be null. callback is copied and may be null.
     MKBitmapLoader(char const* name, Callback* callback);
     ~MKBitmapLoader() override;
 
-    /// Reads the pixels back as the render thread comes to it, then writes the file. False for an empty
-    /// bitmap and when memory runs out. A read-back that the bitmap's queue refuses stays pending for ever:
+    /// Posts a read-back of the pixels; then the loader writes the file. Returns false if the bitmap is empty
+    /// or memory runs out. If the bitmap's queue refuses the read-back, the request stays pending for ever:
     /// the file is not written, nobody is called, and waiting for all saves does not end.
     bool RequestSave(int id, String const& path, IMKBitmap& bitmap, void* userData, int quality);
     using LoaderFrontEnd::RequestSave;

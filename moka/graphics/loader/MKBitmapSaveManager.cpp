@@ -21,7 +21,7 @@ constexpr InfoLog LogInfo{kTag};
 } // namespace
 
 MKBitmapSaveManager::MKBitmapSaveManager() {
-    // A handler logs an error without a loop, which is a supported use of the manager.
+    // The manager may be used without a message loop. A Handler would then log an error.
     if (MessageLoop::GetCurrent()) mHandler.reset(new (std::nothrow) Handler(sm_HandleMessage, this));
     MKBitmapLoader::Callback callback;
     callback.onSave = [this](int, String const&, void* save) { OnSave(save, false); };
@@ -37,7 +37,8 @@ bool MKBitmapSaveManager::RequestSave(int id, String const& path, IMKBitmap& bit
     return save && mLoader && mLoader->RequestSave(id, path, bitmap, save, quality);
 }
 
-// A save that the loader refuses afterwards stays here and stays counted. // Compat: refused-save
+// If the loader refuses the save afterwards, the save stays in the list and stays counted.
+// Compat: refused-save
 MKBitmapSaveManager::Save* MKBitmapSaveManager::AddSave(String const& path,
                                                         SaveCallback const* callback) const {
     SaveList added;
@@ -52,7 +53,7 @@ MKBitmapSaveManager::Save* MKBitmapSaveManager::AddSave(String const& path,
     return &mRequested.back();
 }
 
-// On the loader's thread.
+// Runs on the loader's thread.
 void MKBitmapSaveManager::OnSave(void* save, bool hasError) {
     LogInfo("SaveManager::sm_OnSave mSaveCount(%d) hasError(%d)", mSaveCount.load(),
             static_cast<int>(hasError));
@@ -69,7 +70,8 @@ void MKBitmapSaveManager::OnSave(void* save, bool hasError) {
 void MKBitmapSaveManager::sm_HandleMessage(Handler*, void* manager, int) {
     auto& self = *static_cast<MKBitmapSaveManager*>(manager);
     AutoCriticalSection const lock(self.mLock);
-    // Out of the manager first, since a callback may request and get results of its own.
+    // Moved to a local list first, because a callback may request further saves, whose results arrive in
+    // mResults.
     SaveList results;
     results.swap(self.mResults);
     for (; !results.empty(); results.pop_front()) {

@@ -1,12 +1,12 @@
-/// MKBitmapSaveManager: saves GPU bitmaps to files, counts the saves in flight, and hands each result to the
-/// thread that created the manager, or to a thread that waits for it.
-/// Owner:   the caller. Create it on a thread with a MessageLoop; without one, results come only to those who
-///          wait.
-/// Thread:  requests, waits and the count from any. Results are handed over on the message loop's thread or
-///          on a waiting one, one at a time, with the manager's lock held: they may request further saves,
-///          but neither wait for the manager nor destroy it.
-/// Destroy: from any thread. Saves in flight still write their files; results not yet handed over are
-///          dropped.
+/// MKBitmapSaveManager: saves GPU bitmaps to files, counts unfinished saves, and reports each result on the
+/// thread that created the manager, or on a thread that waits.
+/// Owner:   the caller. Create it on a thread with a MessageLoop. Without one, results are reported only to
+///          threads in WaitForSaveCompleting.
+/// Thread:  requests, waits and the count on any thread. The callbacks run on the message loop's thread or on
+///          a waiting one, one at a time, with the manager's lock held. They may request further saves, but
+///          must not wait for the manager or destroy it.
+/// Destroy: on any thread. Unfinished saves still write their files. Results that were not reported are
+/// dropped.
 /// Fails:   see RequestSave. The event loop of the loader must be running
 ///          (MKBitmapLoader::startEventLoopBySelf).
 #pragma once
@@ -30,9 +30,9 @@ class MKBitmapLoader;
 
 class MOKA_API MKBitmapSaveManager : NonAssignable {
 public:
-    /// Copied with each request. Either function may be null.
+    /// The callbacks of a save. Each request copies it. Each function may be null.
     struct SaveCallback {
-        /// The results of a save; context and userData are passed to both.
+        /// Called when the save succeeded or failed, with context and userData.
         void (*onSaveSucceeded)(void* context, String const* path, void* userData) = nullptr;
         void (*onSaveFailed)(void* context, String const* path, void* userData) = nullptr;
         void* context = nullptr;
@@ -42,17 +42,17 @@ public:
     MKBitmapSaveManager();
     virtual ~MKBitmapSaveManager();
 
-    /// callback may be null; the save counts all the same. False for an empty bitmap and when memory runs
-    /// out; a refused request stays counted, and waiting for the manager then never ends. So does a save
-    /// whose read-back the bitmap's queue refuses.
+    /// Requests a save. callback may be null; the save is counted nevertheless. Returns false if the bitmap
+    /// is empty or memory runs out. A refused request stays counted, and so does a save whose read-back the
+    /// bitmap's queue refuses; WaitForSaveCompleting then never returns.
     bool RequestSave(int id, String const& path, IMKBitmap& bitmap, SaveCallback* callback,
                      int quality) const;
 
-    /// Saves requested whose result has not been handed over.
+    /// The number of saves whose results have not been reported.
     int GetRequestSaveCount() const { return mSaveCount; }
 
-    /// Hands over results on the calling thread until none is missing. queue is the one of the bitmaps, or
-    /// null. Never on the render thread or the loader's.
+    /// Waits for all results and reports them on the calling thread. queue is that of the bitmaps, or null.
+    /// Do not call it on the render thread or the loader's thread.
     void WaitForSaveCompleting(IGLMsgQueue* queue);
 
 private:
@@ -68,14 +68,15 @@ private:
     Save* AddSave(String const& path, SaveCallback const* callback) const;
     static void Dispatch(Save const& save);
 
-    // A save goes from one list to the other without an allocation: once accepted, its result always arrives.
+    // A save moves from one list to the other without an allocation, so the result of an accepted save always
+    // arrives.
     std::atomic<int> mutable mSaveCount{0};
     ConditionalVariable mCondition; // a result arrived
     CriticalSection mutable mLock{true};
     SaveList mutable mRequested;
     SaveList mResults;                       // in the order of arrival
     std::unique_ptr<Handler> mHandler;       // null without a message loop
-    std::unique_ptr<MKBitmapLoader> mLoader; // goes first: what it still calls needs the rest
+    std::unique_ptr<MKBitmapLoader> mLoader; // destroyed first: its callbacks use the other members
 };
 
 } // namespace Moka

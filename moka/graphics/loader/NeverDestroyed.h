@@ -1,5 +1,5 @@
-// NeverDestroyed: a member whose destructor does not run, for what other threads still use while the process
-// ends.
+// NeverDestroyed: a member whose destructor does not run, for objects that other threads still use at process
+// exit.
 #pragma once
 
 #include "moka/base/NonAssignable.h"

@@ -1,5 +1,5 @@
-// PathForLog: a path as a log line may show it: in an engineering build its UTF-8, at most MaxBytes of it,
-// cut at a character boundary; in any other build nothing.
+// PathForLog: the text of a path for log lines. In engineering builds it is UTF-8, cut to MaxBytes at a
+// character boundary. In other builds it is empty, because a path is private data.
 #pragma once
 
 #include "moka/base/String.h"

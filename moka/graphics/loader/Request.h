@@ -1,4 +1,4 @@
-// Request: one job of the loader.
+// Request: one load or save.
 #pragma once
 
 #include "moka/base/String.h"
@@ -16,15 +16,16 @@ namespace detail {
 enum RequestType { REQUEST_LOAD = 0, REQUEST_SAVE = 1, REQUEST_NONE = 2 };
 enum BitmapType { BITMAP_TYPE_CPU = 0, BITMAP_TYPE_GRAPHICS = 1 };
 
-// Moving one leaves behind what says which request it was; the path and the pixels go along.
+// Moving a request moves the path and the pixels. The members that identify it stay valid in the moved-from
+// object.
 struct Request {
-    RequestType type = REQUEST_NONE;           // until it is filled in
-    int serial = -1;                           // in the order of queueing
-    BitmapLoaderInterface* listener = nullptr; // null: nobody is called back
-    int id = 0;                                // the caller's
+    RequestType type = REQUEST_NONE;
+    int serial = -1;                           // increases in the order of queueing
+    BitmapLoaderInterface* listener = nullptr; // null: nobody is called
+    int id = 0;                                // chosen by the caller
     String path;
 
-    // Loads. One side that is 0 means the file's own size.
+    // Loads. If one side is 0, the file is decoded in its own size.
     BitmapType bitmapType = BITMAP_TYPE_CPU;
     IGLMsgQueue* msgQueue = nullptr;
     int loadWidth = 0;
@@ -38,18 +39,18 @@ struct Request {
     int quality = 100;
 };
 
-// A list, because a request goes from one to another, and out of the middle of one, without an allocation
-// that could fail or a move of its neighbours. A request on its own is a list of one.
+// A list, because a request moves from one list to another, and from the middle of one, without an allocation
+// that could fail, and without moving its neighbours. A single request is a list with one element.
 using RequestList = std::list<Request>;
 
-// Of one request; empty when memory runs out.
+// Returns a list with one request, or an empty one if memory runs out.
 RequestList MakeRequest(RequestType type, BitmapLoaderInterface* listener, int id,
                         String const& path) noexcept;
 
-// The request whose address is given, as a list of one; empty when it is not there.
+// Removes the request with this address from the list and returns it; empty if it is not in the list.
 RequestList TakeRequest(RequestList& from, void const* request);
 
-// Saves of this listener still run, but call nobody back.
+// Clears the listener of its saves, so that they call nobody.
 void ClearSaveListener(RequestList& requests, BitmapLoaderInterface const* listener);
 
 } // namespace detail

@@ -6,8 +6,7 @@
 namespace Moka::detail {
 
 std::size_t RequestQueue::Hash::operator()(LoadKey const& key) const {
-    // Ids count up and listeners lie at round addresses: spread the first so that they do not meet the
-    // second.
+    // Ids are often consecutive and addresses are multiples of a power of two. Multiplying avoids collisions.
     constexpr std::size_t kSpread = 0x9E3779B9;
     return reinterpret_cast<std::uintptr_t>(key.listener) ^ static_cast<std::size_t>(key.id) * kSpread;
 }

@@ -1,9 +1,8 @@
-// RequestQueue: the requests that wait for the loader's thread, first come first served, the head being the
-// one that is processed.
+// RequestQueue: the requests that wait for the loader's thread, in first-in, first-out order. The loader
+// processes the head while it is in the queue.
 // Thread: not synchronised.
-// Cost:   everything but the walks over all requests (RemoveAllLoads, ClearSaveListener) takes constant time,
-//         so that queueing and cancelling stay cheap however long the queue is.
-// Fails:  only Append of a load can: memory for its place in the index.
+// Cost:   constant time, except RemoveAllLoads and ClearSaveListener, which visit all requests.
+// Fails:  only Append can fail, if memory for the index of loads runs out.
 #pragma once
 
 #include "moka/base/NonAssignable.h"
@@ -19,20 +18,21 @@ public:
     int GetCount() const { return static_cast<int>(mRequests.size()); }
     Request* GetHead() { return mRequests.empty() ? nullptr : &mRequests.front(); }
 
-    // Takes the request over. A load's listener and id are not queued yet. False: it is still the caller's.
+    // Moves the request into the queue. A load with the same listener and id must not be queued. Returns
+    // false if memory runs out; the request is then unchanged.
     bool Append(RequestList& request) noexcept;
 
     RequestList TakeHead();
 
     bool HasLoad(BitmapLoaderInterface* listener, int id) const { return mLoads.count({listener, id}) != 0; }
-    // Empty when it is not queued.
+    // Removes and returns a load; empty if it is not queued.
     RequestList TakeLoad(BitmapLoaderInterface* listener, int id);
 
     void RemoveAllLoads(BitmapLoaderInterface const* listener);
     void ClearSaveListener(BitmapLoaderInterface const* listener);
 
 private:
-    // What tells loads apart: at most one of each is queued.
+    // The identity of a load. At most one load of each is queued.
     struct LoadKey {
         BitmapLoaderInterface* listener;
         int id;

@@ -28,7 +28,7 @@ Matrix3<T> Product(Matrix3<T> const& left, Matrix3<T> const& right) {
     return result;
 }
 
-// The adjugate, in single precision.
+// Computes the adjugate in single precision.
 template <class T>
 void Adjugate(T const* m, T (&a)[9]) {
     a[0] = m[4] * m[8] - m[7] * m[5];
@@ -47,7 +47,7 @@ bool IsScaleAndTranslation(T const* m) {
     return m[1] == 0 && m[2] == 0 && m[3] == 0 && m[5] == 0 && m[8] == 1;
 }
 
-// Infinity and what is not a number differ from themselves here.
+// Infinity and NaN minus themselves are NaN, which does not equal 0.
 template <class T>
 bool AreFinite(T a, T b, T c, T d) {
     return (a - a) + (b - b) + (c - c) + (d - d) == 0;
@@ -55,7 +55,7 @@ bool AreFinite(T a, T b, T c, T d) {
 
 template <class T>
 void MapCorners(T const* m, T left, T top, T right, T bottom, RectF& box) {
-    // The zeros of such a matrix take no part, unless they meet infinity.
+    // The products with zero elements can be left out, except that 0 times infinity is NaN.
     if (IsScaleAndTranslation(m) && AreFinite(left, top, right, bottom)) {
         T const x0 = m[0] * left + m[6];
         T const x1 = m[0] * right + m[6];
@@ -72,16 +72,16 @@ void MapCorners(T const* m, T left, T top, T right, T bottom, RectF& box) {
     T mappedX[4];
     T mappedY[4];
     T w[4];
-    // Four at once.
+    // Loops over four points, which compilers vectorise.
     for (int i = 0; i < 4; ++i) w[i] = m[2] * xs[i] + m[5] * ys[i] + m[8];
     for (int i = 0; i < 4; ++i) mappedX[i] = m[0] * xs[i] + m[3] * ys[i] + m[6];
     for (int i = 0; i < 4; ++i) mappedY[i] = m[1] * xs[i] + m[4] * ys[i] + m[7];
-    // Dividing by 1 changes nothing, and takes time.
+    // Skips divisions by 1, which cost time and change nothing.
     if (w[0] != 1 || w[1] != 1 || w[2] != 1 || w[3] != 1) {
         for (int i = 0; i < 4; ++i) mappedX[i] /= w[i];
         for (int i = 0; i < 4; ++i) mappedY[i] /= w[i];
     }
-    // Only a first corner that is not a number leaves its trace.
+    // The comparisons skip NaN, except in the first corner.
     box = RectF(mappedX[0], mappedY[0], mappedX[0], mappedY[0]);
     for (int i = 1; i < 4; ++i) {
         box.left = mappedX[i] < box.left ? mappedX[i] : box.left;
@@ -322,7 +322,7 @@ void Matrix3<T>::mapRect(Rect* result, Rect const& source) const {
 
 template <class T>
 void Matrix3<T>::mapRect(RectF* result, RectF const& source) const {
-    RectF const from = source; // which result may be
+    RectF const from = source; // result may point to source
     MapCorners(mElements, from.left, from.top, from.right, from.bottom, *result);
 }
 

@@ -1,4 +1,4 @@
-/// Matrix3: a 3x3 transform of points in the plane, perspective included. A value: nine numbers, nothing else.
+/// Matrix3: a 3x3 transformation of points in the plane, including perspective. A value of nine numbers.
 /// Layout:  column-major; the element at row r, column c is storage element c * 3 + r. Below, m0 ... m8 are
 ///          storage elements.
 /// Points:  columns (x, y, 1), mapped as M * p: w = m2 x + m5 y + m8, x' = (m0 x + m3 y + m6) / w,
@@ -6,7 +6,7 @@
 ///          left (acts last).
 /// Angles:  degrees; a positive one rotates +x towards +y. (Matrix4 takes radians.)
 /// Numbers: single precision, operation by operation in a fixed order, so that every platform gives the same
-///          bits. Nothing is guarded: a division by zero gives what IEEE 754 gives.
+///          bits. There are no checks: a division by zero gives the IEEE 754 result.
 /// Instantiated for float only.
 // Compat: angle-units
 #pragma once
@@ -31,7 +31,7 @@ public:
             T const& m7, T const& m8)
         : mElements{m0, m1, m2, m3, m4, m5, m6, m7, m8} {}
 
-    /// Not bounds-checked.
+    /// Access an element by row and column, or by storage index. Indices are not checked.
     T& operator()(int row, int column) { return mElements[column * 3 + row]; }
     T const& operator()(int row, int column) const { return mElements[column * 3 + row]; }
     T& operator[](int index) { return mElements[index]; }
@@ -56,37 +56,38 @@ public:
     bool operator==(Matrix3 const& other) const;
     bool operator!=(Matrix3 const& other) const { return !(*this == other); }
 
-    /// By value: -0 off the diagonal is still the identity.
+    /// Compares values, so -0 off the diagonal is still the identity.
     bool isIdentity() const;
 
     /// Sets the identity, or all elements to 0.
     void identitySelf();
     void zeroSelf();
 
-    /// A translation, a rotation, a scale.
+    /// Return a translation, a rotation, a scale.
     static Matrix3 translateMatrix(T tx, T ty);
     static Matrix3 rotateMatrix(T degrees);
     static Matrix3 scaleMatrix(T sx, T sy);
 
-    /// These overwrite all nine elements. (px, py) is the point that stays where it is.
+    /// Set all nine elements to a scale, a rotation or a translation. (px, py) is the fixed point; the
+    /// default is the origin.
     void setScale(T sx, T sy);
     void setScale(T sx, T sy, T px, T py);
     void setRotate(T degrees);
     void setRotate(T degrees, T px, T py);
     void setTranslate(T tx, T ty);
 
-    /// The argument may be this matrix.
+    /// Multiply by another matrix, which may be this one.
     void preConcat(Matrix3 const& right); ///< this = this * right
     void postConcat(Matrix3 const& left); ///< this = left * this
 
-    /// this = this * the scale, rotation or translation.
+    /// this = this * a scale, rotation or translation. It acts on points before this matrix.
     void preScale(T sx, T sy);
     void preScale(T sx, T sy, T px, T py);
     void preRotate(T degrees);
     void preRotate(T degrees, T px, T py);
     void preTranslate(T tx, T ty);
 
-    /// this = the scale or rotation * this.
+    /// this = a scale or rotation * this. It acts on points after this matrix.
     void postScale(T sx, T sy);
     void postScale(T sx, T sy, T px, T py);
     void postRotate(T degrees);
@@ -96,18 +97,21 @@ public:
     // Compat: post-translate
     void postTranslate(T tx, T ty);
 
-    /// A determinant of exactly 0 leaves the matrix, or the copy, unchanged; there is no tolerance.
+    /// Invert this matrix, or a copy. If the determinant is exactly 0, the matrix stays unchanged; there is
+    /// no tolerance.
     void inverseSelf();
     Matrix3 inverse() const;
-    /// The nine terms of the adjugate, not divided by the determinant, in storage order.
+    /// Writes the nine elements of the adjugate (not divided by the determinant) to terms, in storage order.
     void calculateMatrix(double* terms) const;
 
-    void transposeSelf(); ///< exact
-    /// Exact except for element 2, which is m5 (m6 is lost).
+    /// Transposes this matrix correctly, unlike transpose().
+    void transposeSelf();
+    /// Returns the transposed matrix, except that element 2 is m5 instead of m6.
     // Compat: transpose-copy
     Matrix3 transpose() const;
 
-    /// The bounding box of the four mapped corners; the integer form rounds it outwards. result may be source.
+    /// Sets result to the bounding box of the four mapped corners of source. The integer function rounds it
+    /// outwards. result may be the same object as source.
     void mapRect(Rect* result, Rect const& source) const;
     void mapRect(RectF* result, RectF const& source) const;
 

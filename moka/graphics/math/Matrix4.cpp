@@ -25,9 +25,8 @@ Vector3<T> Normalized(Vector3<T> const& v) {
     return {v.x * scale, v.y * scale, v.z * scale};
 }
 
-// The signed minor that the adjugate holds at a row and column: that of this matrix without that column and
-// row. The sign goes into each term, so that a minor of zeros is +0 and the inverse of the identity equals
-// it.
+// Returns an element of the adjugate: the signed minor of the matrix without that column and row. The sign is
+// applied to each term, so that a minor of zeros is +0, and the inverse of the identity equals the identity.
 template <class T>
 T AdjugateTerm(Matrix4<T> const& m, int row, int column) {
     int const r0 = column == 0 ? 1 : 0;
@@ -157,8 +156,8 @@ Matrix4<T> Matrix4<T>::rotateMatrix(Vector3<T> dir, Vector3<T> up) {
     return {n.x, n.y, n.z, 0, u.x, u.y, u.z, 0, d.x, d.y, d.z, 0, 0, 0, 0, 1};
 }
 
-// A whole column at a time, which compilers turn into vector instructions; each element is summed from the
-// first term to the last.
+// Computes a column at a time, which compilers vectorise. Each element is summed from the first term to the
+// last.
 template <class T>
 Matrix4<T> Matrix4<T>::operator*(Matrix4 const& right) const {
     T const* const l = mElements;

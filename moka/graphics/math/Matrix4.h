@@ -1,11 +1,11 @@
-/// Matrix4: a 4x4 transform: projections, and the matrices of shaders. A value: sixteen numbers.
+/// Matrix4: a 4x4 transformation, for projections and shader uniforms. A value of sixteen numbers.
 /// Layout:  column-major; the element at row r, column c is storage element c * 4 + r. Below, m0 ... m15 are
 ///          storage elements; m12, m13, m14 hold the translation.
 /// Points:  columns, mapped as M * p.
 /// Angles:  radians for every rotation, degrees for the perspective's field of view. (Matrix3 rotates by
 ///          degrees.)
 /// Numbers: single precision, operation by operation in a fixed order; the determinant in double precision.
-///          Nothing is guarded: a division by zero gives what IEEE 754 gives.
+///          There are no checks: a division by zero gives the IEEE 754 result.
 /// Instantiated for float only.
 #pragma once
 
@@ -29,7 +29,7 @@ public:
             T const& m14, T const& m15)
         : mElements{m0, m1, m2, m3, m4, m5, m6, m7, m8, m9, m10, m11, m12, m13, m14, m15} {}
 
-    /// Not bounds-checked.
+    /// Access an element by row and column, or by storage index. Indices are not checked.
     T& operator()(int row, int column) { return mElements[column * 4 + row]; }
     T const& operator()(int row, int column) const { return mElements[column * 4 + row]; }
     T& operator[](int index) { return mElements[index]; }
@@ -50,46 +50,49 @@ public:
     void identitySelf();
     void zeroSelf();
 
-    /// Projections as in OpenGL, to -1 ... 1; the field of view in degrees.
+    /// Return a projection as in OpenGL, to -1 ... 1. The field of view is in degrees.
     static Matrix4 perspectiveMatrix(T fovyDegrees, T aspect, T zNear, T zFar);
     static Matrix4 orthoMatrix(T left, T right, T bottom, T top, T zNear, T zFar);
-    /// Translations and scales.
+    /// Return a translation, or a scale.
     static Matrix4 translateMatrix(T x, T y, T z);
     static Matrix4 translateMatrix(Vector3<T> const& offset);
     static Matrix4 scaleMatrix(T x, T y, T z);
     static Matrix4 scaleMatrix(Vector3<T> const& factors);
-    /// Rx(ax) * Ry(ay) * Rz(az): z acts first.
+    /// Returns Rx(ax) * Ry(ay) * Rz(az): the rotation about z acts first.
     static Matrix4 rotateMatrix(T ax, T ay, T az);
-    /// Rotates points by minus the angle about the axis, which need not be of unit length.
+    /// Returns a rotation by minus the angle about the axis, which need not have unit length.
     // Compat: axis-angle-direction
     static Matrix4 rotateMatrix(T angle, Vector3<T> const& axis);
-    /// The columns are the unit vectors along dir x up, (dir x up) x dir, and dir.
+    /// Returns the matrix whose columns are the unit vectors along dir x up, (dir x up) x dir, and dir.
     static Matrix4 rotateMatrix(Vector3<T> dir, Vector3<T> up);
 
     /// this * right: right acts on points first.
     Matrix4 operator*(Matrix4 const& right) const;
 
-    /// A determinant of exactly 0 leaves the matrix, or the copy, unchanged; there is no tolerance.
+    /// Invert this matrix, or a copy. If the determinant is exactly 0, the matrix stays unchanged; there is
+    /// no tolerance.
     void inverseSelf();
     Matrix4 inverse() const;
-    /// The sixteen terms of the adjugate, not divided by the determinant, in storage order.
+    /// Writes the sixteen elements of the adjugate (not divided by the determinant) to terms, in storage
+    /// order.
     // Compat: misspelt-names
     void calculaeMatrix(double* terms) const;
 
-    /// Exact.
+    /// Transpose this matrix, or a copy.
     void transposeSelf();
     Matrix4 transpose() const;
 
-    /// index is 0 ... 3, not checked.
+    /// Return a row or a column. index is 0 ... 3 and not checked.
     Vector4<T> row(int index) const;
     Vector4<T> column(int index) const;
 
-    Matrix4 rotation() const;    ///< without the translation; m15 is kept
-    Matrix4 translation() const; ///< the identity with this translation
+    Matrix4 rotation() const;    ///< this matrix without its translation; m15 is kept
+    Matrix4 translation() const; ///< the identity with the translation of this matrix
 
-    /// The Euler rotation with this translation: the rest of this matrix is discarded, not composed.
+    /// Returns the rotation Rx * Ry * Rz with the translation of this matrix. The other elements of this
+    /// matrix are discarded.
     Matrix4 rotate(T ax, T ay, T az) const;
-    /// Overwrites the upper left 3x3 only. Unlike rotate() it keeps m3, m7, m11 and m15.
+    /// Sets the upper left 3x3 elements to that rotation. Unlike rotate() it keeps m3, m7, m11 and m15.
     ///
     // Compat: rotate-self
     void rotateSelf(T ax, T ay, T az);
@@ -105,7 +108,8 @@ using Matrix4f = Matrix4<float>;
 
 static_assert(sizeof(Matrix4f) == 64 && std::is_trivially_copyable_v<Matrix4f>);
 
-/// The transform of the plane as one of space: its perspective row becomes the w row, z passes through.
+/// Converts a transformation of the plane to one of space: the perspective row becomes the w row, and z is
+/// unchanged.
 MOKA_API Matrix4<float> FromMatrix3(Matrix3<float> const& m);
 
 } // namespace Moka

@@ -1,4 +1,4 @@
-// SinCos: sine and cosine of one angle, in single precision, from one call.
+// SinCos: the sine and cosine of an angle, in single precision, computed by one call if the platform has it.
 #pragma once
 
 #include <cmath>

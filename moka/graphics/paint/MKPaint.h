@@ -1,8 +1,8 @@
-/// MKPaint: how a primitive is drawn: colour, tint, blending, fill or stroke, line, dashes, texture tiling.
-/// A value: copied member by member, holds no resources. A draw call takes its own copy.
+/// MKPaint: the drawing attributes of a primitive: colour, tint, blending, fill or stroke, line, dashes,
+/// texture tiling. A value without resources. A draw call copies it.
 /// Thread: one at a time, like any value.
-/// Units:  colour components 0 ... 1, not premultiplied; lengths in pixels. Nothing is checked: every setter
-///         stores its argument.
+/// Units:  colour components 0 ... 1, not premultiplied; lengths in pixels before the canvas's matrix.
+///         Setters do not check their arguments.
 /// A new paint is opaque white, source-over, filled, one pixel wide, not anti-aliased and not dashed.
 #pragma once
 
@@ -13,7 +13,8 @@ namespace Moka {
 
 class MOKA_API MKPaint {
 public:
-    /// How source and destination are combined. The numbers of all four enumerations are ABI.
+    /// The transfer modes, which combine source and destination. The numbers of all four enumerations are
+    /// ABI.
     enum XFermode : int {
         Add = 0,
         Clear = 1,
@@ -27,7 +28,7 @@ public:
         SrcAtop = 9,
         SrcIn = 10,
         SrcOut = 11,
-        SrcOver = 12, ///< premultiplied; any other number, negative ones included, means this
+        SrcOver = 12, ///< premultiplied; also used for all numbers that are not listed
         SrcKeepDstAlpha = 13,
         SrcNonPremultiplied = 14,
         SrcOverNonPremultiplied = 15,
@@ -36,7 +37,7 @@ public:
         BlendingOff = 18,
     };
 
-    /// The stroke lies over the fill. Any other number draws nothing.
+    /// With both, the stroke is drawn over the fill. Any other number draws nothing.
     enum Style : int { Fill = 0, FillAndStroke = 1, Stroke = 2 };
 
     /// The ends of a line, and of each dash.
@@ -46,7 +47,7 @@ public:
         Square = 2, ///< extended by half the width; any other number means this
     };
 
-    /// The content outside a texture. Default is Clamp.
+    /// The content outside a texture. The value Default means Clamp.
     enum TileMode : int { Default = 0, Clamp = 1, Mirror = 2, Repeat = 3 };
 
     MKPaint() = default;
@@ -55,7 +56,7 @@ public:
     MKPaint& operator=(MKPaint const&) = default;
     virtual ~MKPaint();
 
-    /// The colour, not premultiplied. Three components leave the alpha as it is.
+    /// The colour, not premultiplied. With three components the alpha does not change.
     void SetColor(int argb); ///< 0xAARRGGBB
     void SetColor(float r, float g, float b) { mColor = {r, g, b, mColor.w}; }
     void SetColor(float r, float g, float b, float a) { mColor = {r, g, b, a}; }
@@ -68,7 +69,7 @@ public:
     void ClearTintColor();
     bool HasTintColor() const { return mHasTintColor; }
 
-    /// The colour's own alpha; there is no other.
+    /// The alpha of the colour. There is no separate opacity.
     void SetAlpha(float alpha) { mColor.w = alpha; }
     float GetAlpha() const { return mColor.w; }
 
@@ -88,8 +89,8 @@ public:
     void SetAntiAliasing(bool on) { mAntiAliasing = on; }
     bool IsAntiAliasing() const { return mAntiAliasing; }
 
-    /// Lengths of a dash, a gap, a dash, a gap, repeated along the line; two numbers are used twice. A first
-    /// length that is not greater than -1 means no dashes.
+    /// The lengths of a dash, a gap, a dash and a gap, repeated along the line. Two numbers are used twice.
+    /// If the first length is not greater than -1, the line has no dashes.
     void SetDashedLinePattern(Vector2<float> const& pattern) {
         mDashedLinePattern = {pattern.x, pattern.y, pattern.x, pattern.y};
     }
@@ -97,7 +98,7 @@ public:
     Vector4<float> GetDashedLinePattern() const { return mDashedLinePattern; }
     void ClearDashedLinePattern() { mDashedLinePattern = kNoDashes; }
 
-    /// The ends of full lines.
+    /// The ends of lines drawn by DrawLine.
     void SetLineCapType(LineCapType type) { mLineCapType = type; }
     LineCapType GetLineCapType() const { return mLineCapType; }
 

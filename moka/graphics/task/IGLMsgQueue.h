@@ -1,5 +1,5 @@
-/// IGLMsgQueue: the way onto the render thread. The host implements it and hands it to every creating call.
-/// Thread: both operations from any thread, at once.
+/// IGLMsgQueue: the task queue of the render thread. The host implements it and passes it to the factory.
+/// Thread: any number of threads may call both functions at the same time.
 /// The vtable order is ABI.
 // Compat: vtable-order
 #pragma once
@@ -12,11 +12,12 @@ class IGLMsgQueue {
 public:
     virtual ~IGLMsgQueue() = default;
 
-    /// True: accepted. The queue owns the task, runs it exactly once on the render thread, in posting order,
-    /// and frees it. False: refused, and the task still belongs to the caller. Null is tolerated and ignored.
+    /// Returns true if the queue accepts the task. The queue then owns it, runs it exactly once on the render
+    /// thread, in posting order, and deletes it. Returns false if the queue refuses; the caller then still
+    /// owns the task. A null task must be ignored.
     virtual bool Post(ITask* task) = 0;
 
-    /// Blocks until every task posted before the call has run. Never on the render thread itself.
+    /// Waits until every task posted before the call has run. Must not be called on the render thread.
     virtual void WaitForTasks() = 0;
 };
 

@@ -1,9 +1,10 @@
-/// ITask: one piece of work for the render thread, carried there by an IGLMsgQueue.
-/// Owner:   the poster until a queue accepts it; then the queue, which runs it once and frees it. A refused
-///          task goes back to the poster, who frees it without running it.
-/// Thread:  built on any thread, run on the queue's consumer, freed on either.
-/// Cost:    allocated from a pool of fixed blocks (TaskMemory.h), linked through its own field: posting
-///          allocates nothing else. Only the non-throwing form of new exists; null means that memory ran out.
+/// ITask: a task for the render thread, posted to an IGLMsgQueue.
+/// Owner:   the poster until a queue accepts it; then the queue, which runs and deletes it. If the queue
+///          refuses, the poster deletes the task without running it.
+/// Thread:  created on any thread, run on the render thread, deleted on either.
+/// Cost:    allocated from a pool of fixed blocks (TaskMemory.h). Posting allocates nothing else, because
+///          queues link tasks by `next`. Only the non-throwing new exists; it returns null if memory runs
+///          out.
 #pragma once
 
 #include "moka/base/Export.h"
@@ -17,7 +18,7 @@ namespace Moka {
 template <class T>
 class QueueItemBase {
 public:
-    /// The item behind this one.
+    /// The item after this one.
     T* next = nullptr;
 };
 
@@ -31,7 +32,7 @@ public:
     /// Does the work.
     virtual void run() = 0;
 
-    /// For the queue's use; this library never asks.
+    /// A hint for the queue. The library never calls it.
     virtual bool isGlobalLockAllowed() { return true; }
 
     /// Memory from the pool.

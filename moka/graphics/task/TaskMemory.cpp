@@ -33,7 +33,7 @@ constexpr std::size_t kClassSizes[] = {64, 128, 192, 256, 384};
 constexpr std::size_t kClassCount = sizeof kClassSizes / sizeof kClassSizes[0];
 constexpr std::size_t kLargest = kClassSizes[kClassCount - 1];
 
-// The class that holds a size, by the number of cache lines the size fills.
+// The size class for a number of cache lines.
 constexpr std::size_t kClassOfLines[] = {0, 0, 1, 2, 3, 4, 4};
 static_assert(sizeof kClassOfLines / sizeof kClassOfLines[0] == kLargest / kTaskAlignment + 1);
 
@@ -41,7 +41,7 @@ constexpr std::size_t ClassOf(std::size_t size) noexcept {
     return kClassOfLines[(size + kTaskAlignment - 1) / kTaskAlignment];
 }
 
-// What a free block holds. The first block of a batch in a depot also links the batches.
+// The contents of a free block. The first block of a batch in a depot also links the batches.
 struct FreeBlock {
     FreeBlock* next;
     FreeBlock* nextBatch;
@@ -59,18 +59,18 @@ struct Batch {
     void* Pop() noexcept {
         FreeBlock* const block = std::exchange(first, first->next);
         --count;
-        // The block after it was last written by another core; it is fetched while this one is being filled.
+        // Another core wrote the next block last; prefetch it while the caller fills this one.
         __builtin_prefetch(first, 1);
         return block;
     }
 };
 
-// Memory as it was allocated: this line, then kTaskBatch blocks.
+// A unit of allocation: one cache line with this header, then kTaskBatch blocks.
 struct alignas(kTaskAlignment) Chunk {
     Chunk* next;
 };
 
-// Where threads leave batches of one size and find them.
+// Holds batches of one size class that threads have returned, for other threads.
 class alignas(kTaskAlignment) Depot {
 public:
     constexpr Depot() noexcept = default;
@@ -122,7 +122,7 @@ private:
     Chunk* mChunks = nullptr;
 };
 
-// Destructors of statics still post and free tasks, so the depots have none.
+// A union, so that it is never destroyed: destructors of other static objects may still post and free tasks.
 union Depots {
     constexpr Depots() noexcept : each() {}
     ~Depots() {}
@@ -130,8 +130,8 @@ union Depots {
 };
 Depots theDepots;
 
-// A thread's own free blocks. Two batches for each size, so that a thread that allocates and frees in turn
-// does not go to the depot at each step across a batch's end.
+// The free blocks of one thread. Two batches for each size class, so that a thread that allocates and frees
+// in turn does not exchange a batch with the depot at every step.
 enum class CacheState : unsigned char { Unused, Live, Gone };
 struct ThreadCache {
     Batch current[kClassCount];
@@ -139,8 +139,8 @@ struct ThreadCache {
     CacheState state = CacheState::Unused;
 };
 
-// Apart from the reaper, so that the common path has no initialisation to check and so that the cache can
-// still be asked, and says that it is gone, after the reaper has run.
+// Separate from the reaper, so that the common path checks no initialisation, and so that the state of the
+// cache can still be read after the reaper has run.
 thread_local ThreadCache tCache;
 
 struct Reaper {
@@ -155,7 +155,7 @@ struct Reaper {
 };
 thread_local Reaper tReaper;
 
-// True when the thread may keep blocks.
+// Returns true if the thread may keep free blocks.
 bool HasCache(ThreadCache& cache) noexcept {
     if (cache.state == CacheState::Unused) tReaper.Arm();
     return cache.state == CacheState::Live;
@@ -188,7 +188,7 @@ void FreeSlowly(ThreadCache& cache, void* memory, std::size_t index) noexcept {
 void FreeBlockOf(void* memory, std::size_t index) noexcept {
     ThreadCache& cache = tCache;
     Batch& current = cache.current[index];
-    // A cache that is unused or gone has a count of 0, as an empty one has.
+    // The count is also 0 in a cache that is unused or gone.
     if (current.count > 0 && current.count < kTaskBatch) {
         current.Push(memory);
     } else {

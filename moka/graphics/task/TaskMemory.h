@@ -1,12 +1,14 @@
-// TaskMemory: the memory that tasks live in. Blocks of a few fixed sizes, kept in free lists of the thread at
-// hand and exchanged between threads in batches, because a task is allocated on one thread and freed on
-// another, which costs two to three times the whole post when malloc does it.
-// Thread:  any, also while a thread or the process is being torn down.
-// Units:   bytes. Every block starts on a cache line of its own.
-// Cost:    one lock for each kTaskBatch blocks that a thread takes or gives. Memory is kept for reuse until
-//          the process ends: it is bounded by the most tasks ever queued and a few batches for each thread.
-// Fails:   null when memory runs out.
-// Under the address sanitizer every block is allocated by itself, so that the use of a freed task is found.
+// TaskMemory: the memory pool of tasks. Blocks have a few fixed sizes. Each thread has free lists, and
+// threads exchange blocks in batches. A task is allocated on one thread and freed on another; with malloc
+// that costs two to three times as much as the rest of the post.
+// Thread:  any, also at the exit of a thread or the process.
+// Units:   bytes. Every block starts on its own cache line.
+// Cost:    one lock for each kTaskBatch blocks that a thread takes or returns. Memory is kept until the
+//          process ends. It is bounded by the largest number of tasks ever queued, plus a few batches for
+//          each thread.
+// Fails:   returns null if memory runs out.
+// Under the address sanitizer every block is allocated separately, so that it detects the use of a freed
+// task.
 #pragma once
 
 #include <cstddef>
@@ -17,9 +19,9 @@ constexpr std::size_t kTaskAlignment = 64;
 constexpr int kTaskBatch = 32;
 
 void* AllocateTask(std::size_t size) noexcept;
-// size is the one the block was allocated with. Null is ignored.
+// size must be that of the allocation. Null is ignored.
 void FreeTask(void* memory, std::size_t size) noexcept;
-// For whoever does not know the size. Slow: it looks for the block among all there are.
+// Frees a block of unknown size. Slow: it searches all chunks.
 void FreeTask(void* memory) noexcept;
 
 } // namespace Moka::detail

@@ -1,10 +1,9 @@
-/// WorkerTask: tasks that carry a call, with copies of its arguments, or a deletion onto the render thread,
-/// and the functions that post them.
+/// WorkerTask: tasks that call a member function with copies of its arguments, or delete an object, on the
+/// render thread; and functions that post them.
 ///
-/// Arguments are stored by value, in the decayed type of the parameter. A reference parameter is bound to the
-/// task's own copy: a result that a function writes through it is lost with the task.
-/// A by-value parameter gets a fresh copy. The task owns neither the object nor the targets of stored
-/// pointers.
+/// The task stores arguments by value, in the decayed type of the parameter. A reference parameter refers to
+/// the task's copy, so a result that the function writes to it is lost. A by-value parameter gets another
+/// copy. The task owns neither the object nor the targets of stored pointers.
 // Compat: reference-arguments
 #pragma once
 
@@ -17,8 +16,8 @@
 
 namespace Moka::WorkerTask {
 
-/// Calls a member function, virtual ones on the object's dynamic type. F is the type of the member pointer; a
-/// result it returns is discarded.
+/// Calls a member function, which may be virtual, and ignores its result. F is the type of the member
+/// pointer.
 template <class T, class F, class... Arguments>
 class Member final : public ITask {
 public:
@@ -31,7 +30,7 @@ public:
     void run() override { Call(std::index_sequence_for<Arguments...>()); }
 
 private:
-    // Not std::apply: GCC 12 with sanitizers hands it a lambda that it has not initialised.
+    // Not std::apply: with sanitizers, GCC 12 passes it an uninitialised lambda.
     template <std::size_t... Index>
     void Call(std::index_sequence<Index...>) {
         (mObject->*mFunction)(std::get<Index>(mArguments)...);
@@ -56,11 +55,11 @@ using Member4 = Member<T, F, A1, A2, A3, A4>;
 template <class T, class F, class A1, class A2, class A3, class A4, class A5>
 using Member5 = Member<T, F, A1, A2, A3, A4, A5>;
 
-/// Deletes an object when run; a task that is never run leaves it alive.
+/// Deletes an object when it runs. If the task never runs, the object is not deleted.
 template <class T>
 class Delete final : public ITask {
 public:
-    /// Takes pointer over.
+    /// Stores pointer.
     explicit Delete(T* pointer) : mPointer(pointer) {}
     /// Deletes the object.
     void run() override { delete mPointer; }
@@ -69,11 +68,11 @@ private:
     T* mPointer;
 };
 
-/// Frees an array when run.
+/// Deletes an array when it runs.
 template <class T>
 class DeleteArray final : public ITask {
 public:
-    /// Takes pointer over.
+    /// Stores pointer.
     explicit DeleteArray(T* pointer) : mPointer(pointer) {}
     /// Frees the array.
     void run() override { delete[] mPointer; }
@@ -87,7 +86,7 @@ namespace detail {
 template <class T, class F, class... Parameters>
 using MemberFor = Member<T, F, std::decay_t<Parameters>...>;
 
-/// The member task for a function: its parameter types, decayed, are what is stored.
+/// The member task for a function. It stores the decayed parameter types.
 template <class T, class F>
 struct TaskFor;
 template <class T, class R, class C, class... P>
@@ -109,16 +108,16 @@ struct TaskFor<T, R (C::*)(P...) const noexcept> {
 
 } // namespace detail
 
-/// Hands a task over and destroys it at once when the queue refuses it. A null task (memory ran out) is still
-/// offered, so that the queue sees the attempt, and counts as refused.
+/// Posts a task, and deletes it if the queue refuses. Returns true if the queue accepted it. A null task
+/// (memory ran out) is posted as well, so that the queue sees the attempt, and counts as refused.
 inline bool PostOrDestroy(IGLMsgQueue* queue, ITask* task) {
     if (queue->Post(task)) return task != nullptr;
     delete task;
     return false;
 }
 
-/// Posts object->function(values...). If the queue refuses, a reference that the caller took for the task is
-/// kept, so the object is never deleted.
+/// Posts object->function(values...). Returns false if the queue refuses. A reference that the caller took
+/// for the task is then kept, so the object is never deleted.
 // Compat: refused-post
 template <class T, class F, class... Values>
 bool PostMember(IGLMsgQueue* queue, T* object, F function, Values&&... values) {
@@ -126,8 +125,8 @@ bool PostMember(IGLMsgQueue* queue, T* object, F function, Values&&... values) {
     return PostOrDestroy(queue, new (std::nothrow) Task(object, function, std::forward<Values>(values)...));
 }
 
-/// Posts the deletion of a render-side object; refused, the object leaks rather than dying on the wrong
-/// thread.
+/// Posts the deletion of an object. If the queue refuses, the object leaks, because it must not be deleted on
+/// another thread.
 template <class T>
 bool PostDelete(IGLMsgQueue* queue, T* pointer) {
     return PostOrDestroy(queue, new (std::nothrow) Delete<T>(pointer));

@@ -1,6 +1,6 @@
 // Counters: the counts behind RendererStatistics, one set for each attached context.
-// Thread: any thread may read. The render thread writes; counts of objects that other threads may drop are
-//         atomic in both directions.
+// Thread: any thread may read. The render thread writes. Any thread may also write the counts of objects that
+//         other threads may drop.
 #pragma once
 
 #include "moka/renderer/RendererStatistics.h"
@@ -11,10 +11,10 @@
 
 namespace Moka::detail {
 
-// Written by one thread alone, so that counting a draw costs a plain addition.
+// A count that only one thread writes, so that counting costs a plain addition.
 class Counter {
 public:
-    // One addition, in one function, because draws count.
+    // Written as one expression, because every draw calls it.
     void operator++() { mValue.store(mValue.load(std::memory_order_relaxed) + 1, std::memory_order_relaxed); }
     void operator+=(std::uint64_t more) { Set(*this + more); }
     void Set(std::uint64_t value) { mValue.store(value, std::memory_order_relaxed); }
@@ -45,7 +45,7 @@ struct Counters {
     Counter records;
     std::array<Counter, kRunEnds> runEnds;
     Counter flushes;
-    Counter flushedRequests; // of drawRequests, those before the last flush
+    Counter flushedRequests; // drawRequests at the last flush
     Counter listBytes;
 
     Counter frameBufferSwitches;
@@ -63,7 +63,7 @@ struct Counters {
     Counter bytesUploaded;
     Counter vertexBytes;
     Counter bytesReadBack;
-    // Drivers may report errors from threads of their own.
+    // Atomic, because drivers may report errors on their own threads.
     std::atomic<std::uint64_t> errors{0};
 
     RendererStatistics Snapshot() const {

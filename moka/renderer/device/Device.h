@@ -1,10 +1,11 @@
-// Device: the interface of the recorder to a GPU: objects by name, transfers of pixels, and the submission of
-// draw lists. Which device a program has is decided when linking: each device defines MakeDevice.
+// Device: the recorder's interface to a GPU. It creates objects by name, transfers pixels and submits draw
+// lists. The device of a program is chosen at link time: each device defines MakeDevice.
 // Owner:  the recorder, from attaching a context to detaching it.
 // Thread: render thread.
-// Units:  pixels; texture row 0 is row 0 of the frame buffer over it. RGBA8, premultiplied alpha.
-// Fails:  creation gives 0 and logs one error line with the driver's text. Nothing throws except bad_alloc.
-// The recorder validates arguments: sizes are positive and within the limit, blocks are clipped, names exist.
+// Units:  pixels; texture row 0 is row 0 of a frame buffer with the texture. RGBA8, premultiplied alpha.
+// Fails:  creation returns 0 and logs an error with the driver's text. Functions throw nothing but bad_alloc.
+// The recorder validates all arguments: sizes are positive and within the limit, blocks are clipped, names
+// exist.
 #pragma once
 
 #include "moka/renderer/RendererFactory.h"
@@ -27,7 +28,7 @@ struct DeviceCaps {
     std::string version;
 };
 
-// State for external GL to find. Null pointers leave that part as it is.
+// The state to set for external GL. A null pointer leaves that state unchanged.
 struct StateCommit {
     TargetRef const* target = nullptr;
     bool const* scissorTest = nullptr;
@@ -43,7 +44,7 @@ struct StateCommit {
 enum class HostState {
     FrameBuffers,
     VertexInput,
-    All, // both, the viewport, culling, depth test and dither; and no sampler stays bound
+    All, // both, the viewport, culling, depth test and dithering; also unbinds our samplers
 };
 
 class Device {
@@ -53,31 +54,33 @@ public:
 
     virtual DeviceCaps GetCaps() const = 0;
 
-    // Undefined contents, one level, linear filters and clamp to edge for external GL that samples it.
+    // The texture has undefined contents and one level. Its own parameters, which external GL uses, are
+    // linear filters and clamp to edge.
     virtual DeviceName CreateTexture(int width, int height) = 0;
     virtual void DeleteTexture(DeviceName texture) = 0;
-    // pixels addresses the requested block's first pixel; stride is the distance of its rows, any number of
-    // bytes.
+    // pixels points to the first pixel of the requested block. stride is the distance of its rows in bytes
+    // and may be any number.
     virtual void Upload(DeviceName texture, PixelBlock const& block, void const* pixels,
                         std::int64_t stride) = 0;
-    // pixels addresses the requested block's first pixel; rowLength is the distance of its rows in pixels.
+    // pixels points to the first pixel of the requested block. rowLength is the distance of its rows in
+    // pixels.
     virtual void ReadPixels(TargetRef const& target, PixelBlock const& block, void* pixels,
                             int rowLength) = 0;
 
-    // Over the texture's storage, without depth and stencil.
+    // Creates a frame buffer with the texture as its colour attachment, without depth and stencil.
     virtual DeviceName CreateFrameBuffer(DeviceName texture, int width, int height) = 0;
     virtual void DeleteFrameBuffer(DeviceName frameBuffer) = 0;
     // 24 bits of depth and 8 of stencil, undefined contents. TargetRef::depthStencil attaches it.
     virtual DeviceName CreateDepthStencil(int width, int height) = 0;
     virtual void DeleteDepthStencil(DeviceName depthStencil) = 0;
 
-    // Attributes take locations in the order of their declaration. Sources that do not compile give a program
-    // that draws nothing; 0 only when the driver makes no program at all.
+    // Attributes get their locations in the order of their declaration. If the sources do not compile,
+    // returns a program that draws nothing. Returns 0 only if the driver cannot create any program.
     virtual DeviceName CreateProgram(char const* vertexSource, char const* fragmentSource, char const* label,
                                      ProgramLayout* layout) = 0;
     virtual void DeleteProgram(DeviceName program) = 0;
 
-    // The number of a vertex layout; equal layouts have the same number.
+    // Returns the index of a vertex layout; equal layouts have the same one.
     virtual int AddVertexFormat(VertexDescriptor const& descriptor) = 0;
 
     // Executes the commands in order.
@@ -87,21 +90,22 @@ public:
     virtual void Commit(StateCommit const& commit) = 0;
     // Restores the state of the host that Submit, Commit and the transfers changed.
     virtual void RestoreHost(HostState what) = 0;
-    // External GL may have changed any state.
+    // Call this when external GL may have changed any state.
     virtual void InvalidateState() = 0;
 
-    // The frame buffer that the host has bound for drawing, now or beneath ours.
+    // The frame buffer that the host has bound for drawing, or had before the renderer bound another one.
     virtual DeviceName GetHostFrameBuffer() = 0;
     virtual bool QueryScissorTest() = 0;
     virtual ScissorRect QueryScissorRect() = 0;
 
-    // Shows in GL debuggers; the text is copied.
+    // Sets the name that GL debuggers show. The text is copied.
     virtual void LabelTexture(DeviceName texture, char const* text) = 0;
-    // No texture object exists any more, so no sampling state is in use.
+    // Call this when no texture object exists any more, so that no sampler is in use.
     virtual void DeleteSamplers() = 0;
 };
 
-// Null, with one error line, when the current context cannot be used. The counters outlive the device.
+// If the current context cannot be used, logs an error and returns null. The counters must outlive the
+// device.
 std::unique_ptr<Device> MakeDevice(RendererProcLoader loader, Counters& counters);
 
 } // namespace Moka::detail

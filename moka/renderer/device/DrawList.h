@@ -1,5 +1,5 @@
-// DrawList: draws, clears and copies in order, as values that a device submits to GL. Plain data: record/
-// fills it (DrawListBuilder), Device::Submit reads it.
+// DrawList: draws, clears and copies in order, as plain data. DrawListBuilder (record/) fills it, and
+// Device::Submit executes it.
 #pragma once
 
 #include "moka/renderer/device/RunState.h"
@@ -18,14 +18,14 @@ struct Record {
     int count;          // vertices
 };
 
-// Draws with one state. A device that can take each record's values from a block of uniforms draws them with
-// one call for each full block; else each record is a draw call of its own.
+// Draws with one state. A device may draw several records with one call, with their values in a uniform
+// block. Otherwise each record is one draw call.
 struct Run {
     std::size_t state;       // index into the list's states
     std::size_t firstRecord; // index into the list's records
     std::size_t recordCount;
-    bool isContiguous;     // each record's vertices follow the last one's
-    std::uint32_t varying; // a bit for each int or bool, in the order of their offsets: set if records differ
+    bool isContiguous;     // the vertices of each record directly follow those of the one before
+    std::uint32_t varying; // one bit for each int or bool, in the order of offsets: set if its values differ
 };
 
 // Ignores blending and the colour mask. So does DepthStencilClear with the write masks.
@@ -49,15 +49,16 @@ struct DepthStencilClear {
     int stencil;
 };
 
-// The contents are no longer needed.
+// Tells GL that the contents are no longer needed.
 struct Discard {
     TargetRef target;
     bool color;
     bool depthStencil;
 };
 
-// The first rows and columns of from into the texture of to, without a flip: width x height pixels. A source
-// without alpha reads as opaque. to.frameBuffer exists where from is a host's frame buffer; elsewhere it is 0.
+// Copies the first `width` x `height` pixels of `from` to the texture of `to`, without a flip. A source
+// without alpha counts as opaque. to.frameBuffer is set if `from` is a frame buffer of the host; otherwise it
+// is 0.
 struct TargetCopy {
     TargetRef from;
     TargetRef to;
@@ -65,13 +66,13 @@ struct TargetCopy {
     int height;
 };
 
-// The texels of from into the first rows and columns of to, whatever the scissor and the masks are.
+// Copies the texels of `from` to the first rows and columns of `to`. Ignores scissor and masks.
 struct TextureDraw {
     TargetRef from;
     TargetRef to;
 };
 
-// Makes the levels of a texture from its texels. Changes no state that a draw depends on.
+// Generates the mipmap levels of a texture. Changes no state that a draw depends on.
 struct MipmapUpdate {
     DeviceName texture;
 };

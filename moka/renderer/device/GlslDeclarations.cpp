@@ -17,8 +17,8 @@ bool IsOtherQualifier(std::string_view word) {
     return std::find(std::begin(kQualifiers), std::end(kQualifiers), word) != std::end(kQualifiers);
 }
 
-// The variables of one statement whose brackets have been left out: qualifiers, a type, names with commas and
-// initialisers between them.
+// Adds the variables that one statement declares. The statement consists of qualifiers, a type, and names
+// with commas and initialisers; its brackets have been removed.
 void AddVariables(Tokens const& statement, std::vector<std::string> const& wanted,
                   std::vector<GlslDeclaration>& declarations) {
     std::string_view qualifier;
@@ -49,7 +49,7 @@ std::vector<GlslDeclaration> FindGlslDeclarations(char const* source,
         if (found.kind == GlslToken::Kind::Blank || found.kind == GlslToken::Kind::Directive) continue;
         std::string_view const token = found.text;
         if (std::strchr("({[", token.front())) {
-            // What stands before a body is a function or a block, no variable.
+            // The tokens before a body belong to a function or a block, not to a variable.
             if (token == "{" && depth == 0) statement.clear();
             ++depth;
         } else if (std::strchr(")}]", token.front())) {

@@ -1,6 +1,7 @@
-// GlslDeclarations.h: the global variables that a GLSL text declares, found without a compiler: drivers
-// report the active ones only, and in an order of their own.
-// Does not run the preprocessor: both branches of an #if are seen. Interface blocks are skipped.
+// GlslDeclarations.h: finds the global variables that a GLSL source declares, without a compiler. Drivers
+// report only active variables, and not in the order of declaration.
+// It does not run the preprocessor, so it finds declarations in both branches of an #if. It skips interface
+// blocks.
 #pragma once
 
 #include <string>
@@ -14,7 +15,7 @@ struct GlslDeclaration {
     std::string name;
 };
 
-// In the order of the text, those with one of these qualifiers. A null source declares nothing.
+// Returns the declarations with one of these qualifiers, in the order of the source. A null source has none.
 std::vector<GlslDeclaration> FindGlslDeclarations(char const* source,
                                                   std::vector<std::string> const& qualifiers);
 

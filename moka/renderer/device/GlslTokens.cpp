@@ -15,7 +15,8 @@ bool StartsWith(std::string_view text, std::string_view prefix) {
     return text.substr(0, prefix.size()) == prefix;
 }
 
-// Characters up to end and, if it is part of what it ends, past it; all of them without an end.
+// Returns the number of characters up to `end`, including it if includesEnd. Without an `end`, returns the
+// length of the text.
 std::size_t LengthTo(std::string_view text, std::string_view end, std::size_t from, bool includesEnd) {
     std::size_t const found = text.find(end, from);
     if (found == std::string_view::npos) return text.size();
@@ -30,7 +31,7 @@ std::size_t LengthWhile(std::string_view text, Belongs const& belongs) {
 GlslToken First(std::string_view text) {
     if (IsSpace(text.front())) return {Kind::Blank, text.substr(0, LengthWhile(text, IsSpace))};
     if (StartsWith(text, "//")) return {Kind::Blank, text.substr(0, LengthTo(text, "\n", 0, false))};
-    // From behind the opening: "/*/" opens a comment and does not close it.
+    // The search starts after the opening "/*", because "/*/" does not close a comment.
     if (StartsWith(text, "/*")) return {Kind::Blank, text.substr(0, LengthTo(text, "*/", 2, true))};
     if (text.front() == '#') return {Kind::Directive, text.substr(0, LengthTo(text, "\n", 0, false))};
     if (IsWordCharacter(text.front()))

@@ -1,5 +1,5 @@
-// GlslTokens.h: a GLSL text as tokens. Joined, they are the text again.
-// Does not run the preprocessor: a directive is one token, and both branches of an #if are seen.
+// GlslTokens.h: splits a GLSL source into tokens. The tokens joined are the source again.
+// It does not run the preprocessor: a directive is one token, and both branches of an #if are returned.
 #pragma once
 
 #include <string_view>
@@ -16,7 +16,7 @@ struct GlslToken {
     };
 
     Kind kind;
-    std::string_view text; // of the source, which outlives the token
+    std::string_view text; // points into the source, which must outlive the token
 };
 
 std::vector<GlslToken> SplitGlsl(std::string_view source);

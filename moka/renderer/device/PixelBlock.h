@@ -7,7 +7,7 @@
 
 namespace Moka::detail {
 
-// RGBA8, everywhere.
+// All pixels are RGBA8.
 inline constexpr int kBytesPerPixel = 4;
 
 struct PixelBlock {
@@ -24,7 +24,7 @@ struct PixelBlock {
         return static_cast<std::size_t>(width) * static_cast<std::size_t>(height) * kBytesPerPixel;
     }
 
-    // 64 bits, because the extent of a caller's rectangle may exceed an int.
+    // 64-bit parameters, because the width or height of a caller's rectangle may exceed an int.
     static PixelBlock Clip(std::int64_t x, std::int64_t y, std::int64_t width, std::int64_t height,
                            int imageWidth, int imageHeight) {
         std::int64_t const left = std::max<std::int64_t>(x, 0);

@@ -1,6 +1,7 @@
-// ProgramLayout: the uniforms of a linked program and where each value lies in the program's block of values.
-// Values are packed in the order matrices, vec4, vec2, floats, integers, texture units; a bool, an int and a
-// texture unit are 4 bytes. Up to the texture units that is how std140 lays out a structure with these fields.
+// ProgramLayout: the uniforms of a linked program and the offset of each value in the program's block of
+// values. Values are packed in the order matrices, vec4, vec2, floats, integers, texture units. A bool, an
+// int and a texture unit take 4 bytes each. Up to the texture units this equals the std140 layout of a
+// structure with these fields.
 #pragma once
 
 #include "moka/renderer/IParameterBinding.h"
@@ -39,13 +40,13 @@ struct ProgramLayout {
         std::size_t size;   // bytes
     };
 
-    // False: the sources do not compile or link. The program then exists and draws nothing.
+    // False if the sources do not compile or link. The program then exists and draws nothing.
     bool draws = false;
     std::vector<Uniform> uniforms;
     std::vector<std::size_t> samplers; // indices of uniforms, at most kMaxSamplers
     std::size_t size = 0;              // bytes of all values
-    std::size_t integersBegin = 0;     // bytes; ints and bools lie from here
-    std::size_t integersEnd = 0;       // to here, where the texture units begin
+    std::size_t integersBegin = 0;     // offset of the first int or bool, in bytes
+    std::size_t integersEnd = 0;       // offset of the first texture unit, in bytes
 
     bool HasRoomFor(BindingType type) const {
         return type != BindingTypeTextureUnit || samplers.size() < kMaxSamplers;

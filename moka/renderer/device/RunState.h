@@ -1,5 +1,5 @@
-// RunState.h: everything a run of draws depends on except its vertices and uniform values, as comparable values. GPU
-// objects appear by the names that the device gave them.
+// RunState.h: everything a run of draws depends on except its vertices and uniform values, as comparable
+// values. GPU objects appear by the names that the device gave them.
 #pragma once
 
 #include "moka/renderer/BlendStateDescriptor.h"
@@ -13,13 +13,13 @@
 
 namespace Moka::detail {
 
-// The device's own name of an object. 0 is no object, except for frame buffers: a host's may be 0.
+// The device's name of an object. 0 means no object, except for frame buffers: the host's may be 0.
 using DeviceName = std::uint32_t;
 
-// Where a command draws.
+// The target of a command.
 struct TargetRef {
     DeviceName frameBuffer = 0;
-    DeviceName texture = 0; // the frame buffer's colour; 0: the frame buffer belongs to the host
+    DeviceName texture = 0; // the colour attachment; 0: the frame buffer belongs to the host
     int width = 0;          // pixels; 0: the viewport stays as the host set it
     int height = 0;
     DeviceName depthStencil = 0;
@@ -32,7 +32,7 @@ struct TargetRef {
 
 struct ScissorState {
     bool on = false;
-    ScissorRect rect; // of interest only while on
+    ScissorRect rect; // ignored by a device while off
 
     friend bool operator==(ScissorState const& a, ScissorState const& b) {
         return a.on == b.on && a.rect == b.rect;
@@ -61,9 +61,9 @@ struct TextureRef {
     }
 };
 
-// The samplers that one program may have.
+// The largest number of samplers of one program.
 inline constexpr int kMaxSamplers = 4;
-// One for each sampler of the program, in the program's order; the rest is empty.
+// One element for each sampler of the program, in the program's order. The others are empty.
 using TextureRefs = std::array<TextureRef, kMaxSamplers>;
 
 struct RunState {
@@ -73,10 +73,10 @@ struct RunState {
     DepthStencilStateDescriptor depthStencil{false, false};
     DeviceName program = 0;
     TextureRefs textures;
-    int format = 0; // as Device::AddVertexFormat numbers them
+    int format = 0; // from Device::AddVertexFormat
     PrimitiveType primitive = PrimitiveType::TriangleList;
 
-    // Writes the source unchanged.
+    // The state that writes the source colour unchanged.
     static BlendStateDescriptor WithoutBlending() {
         BlendStateDescriptor blend(true);
         blend.SetEnabled(false, true);

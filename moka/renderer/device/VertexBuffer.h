@@ -1,6 +1,6 @@
-// VertexBuffer.h: the vertices of a draw list. A vector, but that appending a few floats is in line, which a
-// draw does each time.
-// Fails: bad_alloc; the buffer is then as it was.
+// VertexBuffer.h: an array of floats that grows, for the vertices of a draw list. Each draw appends a few
+// floats, so Append() is in line, and resize() does not initialise new floats.
+// Fails: throws bad_alloc. The buffer is then as it was before the call.
 #pragma once
 
 #include <algorithm>
@@ -19,7 +19,7 @@ public:
     bool empty() const { return mSize == 0; }
     void clear() { mSize = 0; }
 
-    // Floats that are new have any value.
+    // New floats are uninitialised.
     void resize(std::size_t size) {
         if (size > mCapacity) Grow(size);
         mSize = size;

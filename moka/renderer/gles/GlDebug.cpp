@@ -9,7 +9,7 @@
 namespace Moka::detail {
 namespace {
 
-// The device's, while it exists: calls are checked on the one render thread.
+// The attached device's GlDebug, for CheckGlCall(). Used on the render thread only.
 GlDebug* theDebug = nullptr;
 
 bool HasExtension(char const* name) {
@@ -23,7 +23,7 @@ bool HasExtension(char const* name) {
     return false;
 }
 
-// One driver gives high severity to its advice on speed, such as "stall due to ReadPixels".
+// One driver reports performance hints, such as "stall due to ReadPixels", with high severity.
 bool IsError(GLenum type, GLenum severity) {
     return type == GL_DEBUG_TYPE_ERROR_KHR ||
            (severity == GL_DEBUG_SEVERITY_HIGH_KHR && type != GL_DEBUG_TYPE_PERFORMANCE_KHR);
@@ -31,7 +31,7 @@ bool IsError(GLenum type, GLenum severity) {
 
 void GL_APIENTRY OnMessage(GLenum source, GLenum type, GLuint, GLenum severity, GLsizei,
                            GLchar const* message, void const* counters) {
-    // What a compiler has to say is logged, with the program's name, by who asked for the compilation.
+    // GlProgramBuilder logs compiler messages itself, with the program's name.
     if (source == GL_DEBUG_SOURCE_SHADER_COMPILER_KHR || !IsError(type, severity)) return;
     ++static_cast<Counters*>(const_cast<void*>(counters))->errors;
     __android_log_print(ANDROID_LOG_ERROR, "mok_log", "GL driver: %s", message);
@@ -61,8 +61,8 @@ void GlDebug::Attach(RendererProcLoader loader) {
     if (!loader || !HasExtension("GL_KHR_debug")) return;
     mObjectLabel = reinterpret_cast<PFNGLOBJECTLABELKHRPROC>(loader("glObjectLabelKHR"));
     Gl::GetIntegerv(GL_MAX_LABEL_LENGTH_KHR, &mMaxLabelLength);
-    // Debug output starts switched on in debug contexts and off in others, and a driver may spend time on
-    // messages that nobody asked for.
+    // Debug output is initially on in debug contexts and off in others. It stays off there, because producing
+    // messages may cost a driver time.
     if (!Gl::IsEnabled(GL_DEBUG_OUTPUT_KHR)) return;
     LoadGroups(loader);
     InstallCallback(loader);
@@ -86,7 +86,7 @@ void GlDebug::InstallCallback(RendererProcLoader loader) {
     if (installed) return;
     mSetCallback = setCallback;
     mSetCallback(OnMessage, &mCounters);
-    // Without it a driver may call from threads of its own, after the call that was at fault.
+    // Without it a driver may call back on its own threads, and later than the faulty call.
     Gl::Enable(GL_DEBUG_OUTPUT_SYNCHRONOUS_KHR);
 }
 
@@ -101,7 +101,7 @@ void GlDebug::Detach() {
 
 void GlDebug::Label(GLenum identifier, GLuint name, char const* text) const {
     if (!mObjectLabel) return;
-    // The limit counts the terminating zero.
+    // The limit includes the terminating zero.
     std::size_t const length =
         std::min<std::size_t>(std::strlen(text), static_cast<std::size_t>(std::max(mMaxLabelLength - 1, 0)));
     mObjectLabel(identifier, name, static_cast<GLsizei>(length), text);
@@ -110,7 +110,7 @@ void GlDebug::Label(GLenum identifier, GLuint name, char const* text) const {
 bool GlDebug::TakeErrors(char const* doing) {
     bool clean = true;
     for (GLenum error = glGetError(); error != GL_NO_ERROR; error = glGetError()) {
-        // A lost context reports its loss for ever.
+        // A lost context reports this error on every call.
         constexpr GLenum kContextLost = 0x0507;
         clean = false;
         if (!mSetCallback) {

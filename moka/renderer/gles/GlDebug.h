@@ -1,12 +1,12 @@
 // GlDebug: KHR_debug messages, object labels and groups, and GL errors.
 // Thread: render thread.
-// Fails:  silently; a driver without KHR_debug has no messages, labels and groups.
+// Fails:  silently. Without KHR_debug there are no messages, labels or groups.
 #pragma once
 
 #include "moka/renderer/RendererFactory.h"
 
 #include "moka/renderer/gles/GlFunctions.h"
-// The prototypes of extensions come after the core header.
+// gl2ext.h needs the types of the core header.
 #include <GLES2/gl2ext.h>
 
 namespace Moka::detail {
@@ -17,22 +17,22 @@ class GlDebug {
 public:
     explicit GlDebug(Counters& counters) : mCounters(counters) {}
 
-    // In a debug context whose owner has not set a callback, messages of error severity go to the log and
-    // into the statistics.
+    // Installs a callback in a debug context, unless the host has set its own. The callback logs and counts
+    // messages of error severity.
     void Attach(RendererProcLoader loader);
     void Detach();
 
-    // identifier: GL_TEXTURE and so on. Longer labels than the driver takes are cut.
+    // identifier: GL_TEXTURE and so on. Labels longer than the driver's limit are cut.
     void Label(GLenum identifier, GLuint name, char const* text) const;
 
     // True if the driver has groups and debug output was enabled when the context was attached.
     bool HasGroups() const { return mPushGroup != nullptr; }
 
-    // Takes the pending GL errors; false when there were any since the last check. They are logged with the
-    // operation, and counted, unless the driver's own message has been already. For places where the call
-    // costs nothing beside the work, never for a draw.
+    // Reads the pending GL errors. Returns false if there were any since the last check. Logs each error with
+    // the operation and counts it, unless the driver's callback has reported it. glGetError is slow on some
+    // drivers, so call this after expensive operations only, never after a draw.
     bool Check(char const* doing);
-    // The same after one call, in debug builds; see GlFunctions.h.
+    // Checks after a single GL call in debug builds; see GlFunctions.h.
     void CheckCall(char const* call);
 
 private:
@@ -46,15 +46,15 @@ private:
     PFNGLOBJECTLABELKHRPROC mObjectLabel = nullptr;
     PFNGLPUSHDEBUGGROUPKHRPROC mPushGroup = nullptr;
     PFNGLPOPDEBUGGROUPKHRPROC mPopGroup = nullptr;
-    PFNGLDEBUGMESSAGECALLBACKKHRPROC mSetCallback = nullptr; // null: none of ours is installed
+    PFNGLDEBUGMESSAGECALLBACKKHRPROC mSetCallback = nullptr; // null if our callback is not installed
     GLint mMaxLabelLength = 0;
     bool mCallFailed = false; // since the last check
 };
 
-// A scope whose GL calls a debugger shows as a group.
+// Makes GL debuggers show the GL calls of a scope as a group.
 class GlDebugGroup {
 public:
-    // debug has groups.
+    // Requires debug.HasGroups().
     GlDebugGroup(GlDebug const& debug, char const* name) : mPop(debug.mPopGroup) {
         debug.mPushGroup(GL_DEBUG_SOURCE_APPLICATION_KHR, 0, -1, name);
     }

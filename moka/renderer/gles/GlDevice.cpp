@@ -65,8 +65,9 @@ DeviceName GlDevice::CreateTexture(int width, int height) {
     GLuint name = 0;
     Gl::GenTextures(1, &name);
     GlEditTexture const edit(state, name);
-    // Samplers overrule these; they are for external GL that samples the texture without one. They go before the
-    // storage: drivers reserve room for all levels when the filter or the last level lets them expect some.
+    // Our draws use samplers, which override these parameters. External GL may sample the texture without a
+    // sampler. The parameters are set before the storage is allocated, because drivers allocate all mipmap
+    // levels if the filter or the maximum level suggests that they are needed.
     Gl::TexParameteri(GL_TEXTURE_2D, GL_TEXTURE_MAX_LEVEL, 0);
     Gl::TexParameteri(GL_TEXTURE_2D, GL_TEXTURE_MIN_FILTER, GL_LINEAR);
     Gl::TexParameteri(GL_TEXTURE_2D, GL_TEXTURE_MAG_FILTER, GL_LINEAR);
@@ -95,7 +96,7 @@ void GlDevice::UpdateMipmap(DeviceName texture) {
     Gl::GenerateMipmap(GL_TEXTURE_2D);
     ++counters.mipmapUpdates;
     if (debug.Check("making the levels of a texture")) return;
-    // Without all of its levels GL samples it as black.
+    // GL samples an incomplete texture as black, so go back to level 0 only.
     Gl::TexParameteri(GL_TEXTURE_2D, GL_TEXTURE_MAX_LEVEL, 0);
 }
 

@@ -1,4 +1,4 @@
-// GlDevice: the device over OpenGL ES 3.0 core.
+// GlDevice: implements Device with OpenGL ES 3.0 core.
 // Thread: render thread, with the context current.
 #pragma once
 

@@ -39,7 +39,7 @@ GLuint GlFrameBuffers::CreateDepthStencil(GLsizei width, GLsizei height) {
     return 0;
 }
 
-// One that stays attached would live on without a name.
+// Detaches the render buffer first: GL keeps a deleted render buffer alive while it is attached.
 void GlFrameBuffers::DeleteDepthStencil(GLuint renderBuffer) {
     std::vector<GLuint> holders;
     for (auto const& [frameBuffer, attached] : mAttached) {
@@ -55,8 +55,8 @@ void GlFrameBuffers::Attach(TargetRef const& target) {
     if (attached != target.depthStencil) Attach(target.frameBuffer, target.depthStencil);
 }
 
-// Through the reading side, which is free when the target is bound and otherwise leaves the drawing side
-// alone.
+// Binds the frame buffer for reading. If it is bound already this costs nothing; if not, the draw binding
+// stays unchanged.
 void GlFrameBuffers::Attach(GLuint frameBuffer, GLuint renderBuffer) {
     mHost.BindRead(frameBuffer);
     Gl::FramebufferRenderbuffer(GL_READ_FRAMEBUFFER, GL_DEPTH_STENCIL_ATTACHMENT, GL_RENDERBUFFER,

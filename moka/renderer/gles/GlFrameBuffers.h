@@ -1,6 +1,6 @@
-// GlFrameBuffers: frame buffer objects over textures, and the depth-stencil render buffers attached to them.
-// A frame buffer keeps its last attachment until a command needs another one, because attaching makes a driver
-// validate the frame buffer anew and clips attach on every draw.
+// GlFrameBuffers: frame buffer objects with textures, and the depth-stencil render buffers attached to them.
+// A frame buffer keeps its render buffer until a command needs another one, because stencil clips attach one
+// on every draw, and drivers validate a frame buffer again after each attachment.
 // Thread: render thread.
 #pragma once
 
@@ -21,13 +21,13 @@ public:
     GlFrameBuffers(GlState& state, GlHostState& host, GlDebug& debug)
         : mState(state), mHost(host), mDebug(debug) {}
 
-    // 0, with one error line, when the driver refuses.
+    // If the driver cannot create the frame buffer, logs an error and returns 0.
     GLuint Create(GLuint texture, GLsizei width, GLsizei height);
     void Delete(GLuint frameBuffer);
     GLuint CreateDepthStencil(GLsizei width, GLsizei height);
     void DeleteDepthStencil(GLuint renderBuffer);
 
-    // The target's frame buffer has the target's render buffer attached, and no other.
+    // Attaches the target's render buffer, or none, to the target's frame buffer.
     void Attach(TargetRef const& target);
 
 private:
@@ -36,7 +36,7 @@ private:
     GlState& mState;
     GlHostState& mHost;
     GlDebug& mDebug;
-    std::unordered_map<GLuint, GLuint> mAttached; // render buffer by frame buffer, those that have one
+    std::unordered_map<GLuint, GLuint> mAttached; // frame buffer to attached render buffer
 };
 
 } // namespace Moka::detail

@@ -1,5 +1,5 @@
-// GlFunctions.h: every GL function that the renderer calls, as Gl::Name. In debug builds each call is followed
-// by an error check that names it; otherwise Gl::Name is the function itself.
+// GlFunctions.h: the table of all GL functions that the renderer calls, as Gl::Name. In debug builds Gl::Name
+// also checks for errors after the call and logs its name. In other builds it is the function itself.
 // Thread: render thread.
 #pragma once
 
@@ -29,7 +29,7 @@ namespace Moka::detail {
 
 #if defined(MOKA_CHECKS) && MOKA_CHECKS
 
-// Takes the pending errors after a call, logs each with the call's name, and tells the device's GlDebug.
+// Passes the call's name to GlDebug::CheckCall of the attached device.
 void CheckGlCall(char const* call);
 
 template <class Function>
@@ -55,7 +55,7 @@ private:
     char const* const mName;
 };
 
-// The name of a member cannot stand in parentheses. NOLINTBEGIN(bugprone-macro-parentheses)
+// C++ does not allow parentheses around a member's name. NOLINTBEGIN(bugprone-macro-parentheses)
 #define MOKA_GL_FUNCTION(Name)                                                                               \
     static constexpr GlFunction<decltype(&::gl##Name)> Name{&::gl##Name, "gl" #Name};
 // NOLINTEND(bugprone-macro-parentheses)

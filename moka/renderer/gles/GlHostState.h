@@ -1,5 +1,6 @@
-// GlHostState: the host's GL state beneath ours: it is saved when something of ours first takes its place, and
-// restored on request. Frame buffers, viewport, vertex input, and the tests that obstruct drawing.
+// GlHostState: saves each part of the host's GL state before the renderer first changes it, and restores it
+// on request. The parts are frame buffers, viewport, vertex array, buffers, and the switches of
+// GlObstaclesAccess.
 // Thread: render thread.
 #pragma once
 
@@ -13,30 +14,29 @@ class GlHostState {
 public:
     explicit GlHostState(GlState& state) : mState(state) {}
 
-    // Frame buffers, saving the host's.
+    // Bind frame buffers, and save the host's bindings.
     void Bind(GlBoundFrameBuffers const& wanted);
     void BindDraw(GLuint frameBuffer);
     void BindRead(GLuint frameBuffer);
-    // With a viewport of this size (none is set for a width of 0), and nothing in the way of drawing.
+    // Binds the frame buffer, sets a viewport of this size unless width is 0, and saves the obstacles.
     void BindTarget(GLuint frameBuffer, GLsizei width, GLsizei height);
-    // The tests that obstruct drawing may be changed afterwards.
+    // Call these before changing the state: the switches of GlObstaclesAccess, the vertex array and the array
+    // buffer, or the general uniform buffer binding.
     void SaveObstacles();
-    // Vertex array and buffer may be changed afterwards.
     void SaveVertexInput();
-    // The general binding of uniform buffers may be changed afterwards.
     void SaveUniformBuffer();
 
-    // The frame buffer that the host draws into.
+    // The frame buffer that the host has bound for drawing.
     GLuint GetFrameBuffer();
 
     void RestoreFrameBuffers();
     void RestoreVertexInput();
-    // Everything, and no sampler stays bound.
+    // Restores all parts and unbinds our samplers.
     void RestoreAll();
 
 private:
     GlState& mState;
-    // Present while something of ours is in their place.
+    // Each has a value while the renderer has changed that state.
     std::optional<GlBoundFrameBuffers> mFrameBuffers;
     std::optional<GlBox> mViewport;
     std::optional<unsigned> mObstacles;

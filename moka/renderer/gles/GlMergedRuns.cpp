@@ -36,7 +36,7 @@ void GlMergedRuns::Place(DrawList const& list, Run const& run, int* budget) {
     PlaceRecords(list, run, variants->GetLayout());
 }
 
-// Up to the next place where a block may begin.
+// Rounds bytes up to the alignment of uniform blocks.
 std::size_t GlMergedRuns::GetBlockStep(std::size_t bytes) const {
     return (bytes + mAlignment - 1) / mAlignment * mAlignment;
 }
@@ -59,7 +59,7 @@ void GlMergedRuns::PlaceRecords(DrawList const& list, Run const& run, ProgramLay
 }
 
 void GlMergedRuns::Upload() {
-    // The last block is as large as its declaration, too.
+    // GL requires that the range bound for the last block is as large as the declared block.
     mRecords.resize(mRecords.size() + kBlockBytes);
     if (mRecordBuffer == 0) {
         Gl::GenBuffers(1, &mRecordBuffer);

@@ -1,8 +1,8 @@
-// GlMergedRuns: draws runs whose uniform values differ from record to record, with one call for each full block
-// of records.
+// GlMergedRuns: draws runs whose uniform values differ between records, with one draw call for each uniform
+// block of records.
 // Thread: render thread.
-// Cost:   each submission uploads the records and a number for each vertex, one buffer each; the memory for
-//         both is kept.
+// Cost:   each submission uploads one buffer of records and one buffer with the record number of each vertex.
+//         Their memory is reused.
 #pragma once
 
 #include "moka/renderer/device/DrawList.h"
@@ -20,23 +20,24 @@ class GlMergedRuns {
 public:
     explicit GlMergedRuns(GlDevice& device) : mDevice(device) {}
 
-    // Once for each submission, before its first draw: chooses the runs that are merged and uploads what they
-    // need.
+    // Call this once for each submission, before the first draw. Chooses the runs to merge and uploads their
+    // records and record numbers.
     void Prepare(DrawList const& list);
-    // The list's runs in order. False: this one's records are to be drawn one by one.
+    // Call this for each run of the list, in order. Returns false if the caller must draw the records one by
+    // one.
     bool Draw(DrawList const& list, Run const& run);
     void Clear();
 
 private:
-    // Variants that are linked during one submission at most: linking one takes milliseconds.
+    // At most this many variants are linked in one submission, because each takes milliseconds.
     static constexpr int kMostLinks = 4;
 
     struct Merged {
         Run const* run;
         GlVariants* variants;
         std::size_t variant; // index
-        std::size_t records; // offset of the first block, bytes
-        std::size_t numbers; // offset, numbers
+        std::size_t records; // offset of the first block in mRecords, in bytes
+        std::size_t numbers; // index of the first number in mNumbers
     };
 
     void Place(DrawList const& list, Run const& run, int* budget);
@@ -46,12 +47,12 @@ private:
 
     GlDevice& mDevice;
     std::vector<Merged> mMerged;
-    std::size_t mNext = 0; // of mMerged
+    std::size_t mNext = 0; // index of the next run in mMerged
     std::vector<unsigned char> mRecords;
-    std::vector<GLushort> mNumbers; // of each vertex: its record's place in the block
+    std::vector<GLushort> mNumbers; // for each vertex, the index of its record in the block
     GLuint mRecordBuffer = 0;
     GLuint mNumberBuffer = 0;
-    std::size_t mAlignment = 0; // of a block in its buffer, bytes; 0 before it was queried
+    std::size_t mAlignment = 0; // of a block in its buffer, in bytes; 0 until it is queried
 };
 
 } // namespace Moka::detail

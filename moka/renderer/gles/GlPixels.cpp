@@ -7,7 +7,8 @@
 namespace Moka::detail {
 namespace {
 
-// Leaves GL's defaults behind, as external GL may expect.
+// Sets the pixel store parameters for a scope. Restores GL's defaults afterwards, as external GL may expect
+// them.
 template <class Access>
 class GlPixelStoreScope {
 public:
@@ -31,7 +32,7 @@ void Upload(GLint x, GLint y, GLsizei width, GLsizei height, void const* pixels)
 } // namespace
 
 void ReservePixels(GlState& state, GLsizei width, GLsizei height) {
-    GlPixelStoreScope const store(state.unpack, 0); // no buffer of the host's to read from
+    GlPixelStoreScope const store(state.unpack, 0); // unbinds the host's pixel unpack buffer
     Gl::TexImage2D(GL_TEXTURE_2D, 0, static_cast<GLint>(kGlInternalFormat), width, height, 0, kGlFormat,
                    kGlType, nullptr);
 }
@@ -45,7 +46,7 @@ void UploadPixels(GlState& state, PixelBlock const& block, void const* pixels, s
         Upload(block.x, block.y, block.width, block.height, row);
         return;
     }
-    // GL counts the distance of rows in pixels, so these rows go one by one. Rare: no codec makes them.
+    // GL's row length is in whole pixels. Other strides upload row by row; no codec of ours produces them.
     GlPixelStoreScope const store(state.unpack, 0);
     for (GLsizei y = 0; y < block.height; ++y, row += stride)
         Upload(block.x, block.y + y, block.width, 1, row);

@@ -1,4 +1,4 @@
-// GlPixels.h: moving blocks of pixels between images in memory and GL, straight, without a copy in between.
+// GlPixels.h: uploads and reads back blocks of pixels directly, without an intermediate copy.
 // Thread: render thread.
 #pragma once
 
@@ -7,16 +7,16 @@
 
 namespace Moka::detail {
 
-// Storage for the level 0 of the texture bound by GlEditTexture. Not immutable, so that levels may be added:
-// few textures have any.
+// Allocates level 0 of the texture bound by GlEditTexture. The storage is not immutable, so that the few
+// textures that need mipmap levels can get them later.
 void ReservePixels(GlState& state, GLsizei width, GLsizei height);
 
-// To the texture bound by GlEditTexture. pixels addresses the requested block's first pixel; stride is the
-// distance of its rows in bytes, any number.
+// Uploads to the texture bound by GlEditTexture. pixels points to the first pixel of the requested block.
+// stride is the distance of its rows in bytes and may be any number.
 void UploadPixels(GlState& state, PixelBlock const& block, void const* pixels, std::int64_t stride);
 
-// From the frame buffer bound for reading. pixels addresses the requested block's first pixel; rowLength is
-// the distance of its rows in pixels.
+// Reads from the frame buffer bound for reading. pixels points to the first pixel of the requested block.
+// rowLength is the distance of its rows in pixels.
 void ReadBackPixels(GlState& state, PixelBlock const& block, void* pixels, GLint rowLength);
 
 } // namespace Moka::detail

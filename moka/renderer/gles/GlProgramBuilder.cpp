@@ -8,11 +8,11 @@
 namespace Moka::detail {
 namespace {
 
-// Every vertex lies outside the clip volume: whatever is drawn, nothing arrives.
+// The placeholder program. Every vertex lies outside the clip volume, so nothing is rasterized.
 constexpr char kVertexOutside[] = "#version 100\nvoid main() { gl_Position = vec4(2.0, 2.0, 2.0, 1.0); }\n";
 constexpr char kFragmentNever[] = "#version 100\nvoid main() { gl_FragColor = vec4(0.0); }\n";
 
-// The driver's text without the line end that most drivers put behind it.
+// Returns the driver's log without the line break that most drivers append.
 template <class Query>
 std::string ReadLog(GLint length, Query query) {
     std::string text(static_cast<std::size_t>(length > 0 ? length : 1), '\0');

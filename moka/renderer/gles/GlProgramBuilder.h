@@ -1,5 +1,5 @@
-// GlProgramBuilder.h: GLSL texts become a linked GL program.
-// Thread: render thread, inside an operation.
+// GlProgramBuilder.h: compiles and links GL programs.
+// Thread: render thread.
 #pragma once
 
 #include "moka/renderer/gles/GlFunctions.h"
@@ -8,13 +8,13 @@
 
 namespace Moka::detail {
 
-// Attributes get their locations in the order of their declaration. A pair that does not compile or link is
-// logged with the driver's text, and a placeholder that draws nothing takes its place (draws is false). 0 only
-// when the driver makes no program at all.
+// Attributes get their locations in the order of their declaration. If the sources do not compile or link,
+// this logs the driver's text, sets *draws to false and returns a placeholder that draws nothing. It returns
+// 0 only if the driver cannot create any program.
 GLuint BuildGlProgram(char const* vertexSource, char const* fragmentSource, char const* label, bool* draws);
 
-// The same without a placeholder and without a log line: 0, with failure set. attributeSource declares the
-// attributes whose locations are given.
+// Like BuildGlProgram, but on failure it sets *failure, logs nothing and returns 0. The attributes get their
+// locations in the order in which attributeSource declares them.
 GLuint LinkGlProgram(char const* vertexSource, char const* fragmentSource, char const* attributeSource,
                      std::string* failure);
 

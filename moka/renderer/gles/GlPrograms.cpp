@@ -18,7 +18,7 @@ void GlPrograms::Add(GLuint name, GlslStages sources, char const* label, Program
     for (GLint i = 0; layout->draws && i < count; ++i) {
         AddUniform(name, static_cast<GLuint>(i), label, program);
     }
-    program.sent.resize(program.layout.size); // linking sets every uniform to zero
+    program.sent.resize(program.layout.size); // zero, as GL sets uniforms when it links
     *layout = program.layout;
     if (!layout->draws) return;
     program.variants =
@@ -43,7 +43,7 @@ void GlPrograms::AddUniform(GLuint name, GLuint index, char const* label, Progra
 }
 
 void GlPrograms::Delete(GLuint name) {
-    // A current program would survive its deletion.
+    // GL keeps a deleted program alive while it is current.
     if (mState.program.Get() == name) mState.program.Set(0);
     Gl::DeleteProgram(name);
     mPrograms.erase(name);

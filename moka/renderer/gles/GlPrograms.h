@@ -1,4 +1,5 @@
-// GlPrograms: linked programs and the uniform values that GL has for each, so that equal values are sent once.
+// GlPrograms: linked programs, each with the uniform values that GL has, so that only changed values are
+// sent.
 // Thread: render thread.
 #pragma once
 
@@ -18,7 +19,8 @@ class GlPrograms {
 public:
     GlPrograms(GlState& state, GlDebug const& debug) : mState(state), mDebug(debug) {}
 
-    // Reads the program's uniforms. Those of types that no parameter has are logged by name and left out.
+    // Reads the program's uniforms into *layout. Logs uniforms of unsupported types by name and leaves them
+    // out.
     void Add(GLuint program, GlslStages sources, char const* label, ProgramLayout* layout);
     void Delete(GLuint program);
 
@@ -42,7 +44,7 @@ private:
     GlState& mState;
     GlDebug const& mDebug;
     std::unordered_map<GLuint, Program> mPrograms;
-    // The program applied last, which the next draw uses as well in most cases.
+    // The program applied last. In most cases the next draw uses it as well, which saves the look-up.
     GLuint mLastName = 0;
     Program* mLast = nullptr;
 };

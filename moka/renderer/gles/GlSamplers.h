@@ -1,5 +1,5 @@
-// GlSamplers: one GL sampler object for each sampling state in use, made when it is first needed. Textures with
-// equal states share it, so that changing a parameter back and forth makes nothing new.
+// GlSamplers: one GL sampler object for each sampling state, created at its first use. Textures with equal
+// states share it, so changing a parameter back and forth creates nothing.
 // Thread: render thread.
 #pragma once
 

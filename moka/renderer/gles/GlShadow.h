@@ -1,7 +1,7 @@
-// GlShadow: one concept of GL state as a comparable value: set only when it differs, asked for only when
-// unknown. GlOverride changes it for a scope.
-// An Access type supplies the Value (with ==), Apply(value, known) with known null while nothing is known,
-// and, where somebody asks for it, Query().
+// GlShadow: caches one part of GL state as a comparable value. It calls GL only if the value differs, and
+// queries GL only if the value is unknown. GlOverride changes the value for a scope.
+// An Access type supplies the Value (with ==), Apply(value, known), where known is null if the value is
+// unknown, and Query() if Get() is used.
 // Thread: render thread.
 #pragma once
 
@@ -26,7 +26,7 @@ public:
         return *mValue;
     }
 
-    // Whether GL had to be called.
+    // Returns true if it called GL.
     bool Set(Value const& value) {
         if (mValue && *mValue == value) return false;
         Access::Apply(value, mValue ? &*mValue : nullptr);
@@ -36,7 +36,7 @@ public:
 
     void Forget() { mValue.reset(); }
 
-    // For what GL changes by itself; null while nothing is known.
+    // Gives access to the cached value, to follow changes that GL makes itself. Null if the value is unknown.
     Value* Known() { return mValue ? &*mValue : nullptr; }
 
 private:

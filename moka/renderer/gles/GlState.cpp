@@ -60,7 +60,7 @@ void GlState::SetBlend(BlendStateDescriptor const& descriptor) {
     if (colorMask.Set({write, write, write, write})) ++counters.blendChanges;
 }
 
-// The masks hold while a test is on; otherwise they are left as they are.
+// Sets the write masks only while a test is on, because they have no effect otherwise.
 void GlState::SetDepthStencil(DepthStencilStateDescriptor const& descriptor) {
     bool const depth = descriptor.IsDepth();
     if (obstacles.Set(depth ? GlObstaclesAccess::kDepthTest : 0)) {
@@ -78,7 +78,7 @@ void GlState::SetDepthStencil(DepthStencilStateDescriptor const& descriptor) {
 void GlState::BindTexture(int unit, GLuint texture, GLuint sampler) {
     Unit& bound = mUnits[static_cast<std::size_t>(unit)];
     if (bound.texture != texture) {
-        // External GL finds its own unit active again.
+        // Restores the active unit afterwards, for external GL.
         GlOverride<GlActiveUnitAccess> const active(activeUnit, unit);
         Gl::BindTexture(GL_TEXTURE_2D, texture);
         bound.texture = texture;

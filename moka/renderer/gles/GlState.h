@@ -1,5 +1,5 @@
-// GlState: the cache of the actual GL state, one value for each part that the renderer sets or depends on.
-// Redundant calls are not made. GlHostState keeps the state of the host.
+// GlState: the cache of the actual GL state, with one GlShadow for each part that the renderer sets or
+// depends on. It leaves out redundant GL calls. GlHostState keeps the state of the host.
 // Thread: render thread.
 #pragma once
 
@@ -18,13 +18,13 @@ public:
     // Reads the number of texture units from the current context.
     explicit GlState(Counters& counters);
 
-    // Somebody else may have changed anything.
+    // Makes all values unknown, because external GL may have changed any.
     void Invalidate();
 
-    // The state of a draw. Each setter counts its changes.
+    // Set the state of a draw, and count changes in the statistics.
     void SetScissorTest(bool on);
     void SetScissorRect(GlBox const& box);
-    // The rectangle only while the test is on.
+    // Sets the rectangle only if the test is on.
     void SetScissor(ScissorState const& scissor);
     void SetBlend(BlendStateDescriptor const& blend);
     void SetDepthStencil(DepthStencilStateDescriptor const& depthStencil);
@@ -49,19 +49,19 @@ public:
     GlShadow<GlPixelStoreAccess<GlUnpackNames>> unpack{counters};
     GlShadow<GlPixelStoreAccess<GlPackNames>> pack{counters};
 
-    // Units for sampling are 0 up to this number. The one after them is kept for uploads and copies, so that
-    // bindings of external GL and of draws stay.
+    // Draws sample units 0 to this number minus 1. The next unit is reserved for uploads and copies, so that
+    // these do not change the bindings of draws and of external GL.
     int GetSamplingUnitCount() const { return static_cast<int>(mUnits.size()) - 1; }
 
     void BindTexture(int unit, GLuint texture, GLuint sampler);
-    // No sampler of ours stays on any unit, where it would overrule the parameters of an external texture.
+    // Unbinds our samplers from all units, because they would override the parameters of external textures.
     void UnbindSamplers();
 
-    // GL unbinds deleted objects; so does the shadow.
+    // Call these when an object is deleted: GL unbinds it, and so does the cache.
     void ForgetTexture(GLuint texture);
     void ForgetSampler(GLuint sampler);
     void ForgetVertexArray(GLuint name);
-    // Of vertices or of uniforms.
+    // For array buffers and uniform buffers.
     void ForgetBuffer(GLuint name);
     void ForgetFrameBuffer(GLuint frameBuffer);
 
@@ -75,10 +75,10 @@ private:
     };
 
     std::vector<Unit> mUnits;
-    std::vector<int> mSamplerUnits; // those where a sampler of ours is bound
+    std::vector<int> mSamplerUnits; // the units that have one of our samplers bound
 };
 
-// Binds a texture for changing it, on the unit kept for that, and makes that unit the active one for a scope.
+// Binds a texture to the reserved unit, to change it, and makes that unit active for a scope.
 class GlEditTexture {
 public:
     GlEditTexture(GlState& state, GLuint texture);

@@ -19,12 +19,12 @@ GlBox QueryBox(GLenum name) {
     return {v[0], v[1], v[2], v[3]};
 }
 
-// The first one has a name of its own.
+// The capability of each bit of GlObstaclesAccess. The first one is kDepthTest.
 constexpr GLenum kObstacles[] = {
     GL_DEPTH_TEST,      GL_CULL_FACE,         GL_DITHER, GL_POLYGON_OFFSET_FILL, GL_SAMPLE_ALPHA_TO_COVERAGE,
     GL_SAMPLE_COVERAGE, GL_RASTERIZER_DISCARD};
 
-// Switches what is not known to be switched already.
+// Enables or disables the capability unless it is known to be in that state.
 void Switch(GLenum capability, bool on, bool const* known) {
     if (known && *known == on) return;
     on ? Gl::Enable(capability) : Gl::Disable(capability);
@@ -126,7 +126,7 @@ void GlProgramAccess::Apply(GLuint value, GLuint const*) { Gl::UseProgram(value)
 void GlBlendAccess::Apply(Value const& value, Value const* known) {
     Switch(GL_BLEND, value.on, known ? &known->on : nullptr);
     if (!value.on) return;
-    // Nobody here sets another equation, so it needs setting only where external GL may have.
+    // The renderer always uses GL_FUNC_ADD, so only external GL may have set another equation.
     if (!known) Gl::BlendEquation(GL_FUNC_ADD);
     Gl::BlendFuncSeparate(value.color[0], value.color[1], value.alpha[0], value.alpha[1]);
 }

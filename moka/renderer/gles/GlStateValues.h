@@ -1,5 +1,5 @@
-// GlStateValues.h: the parts of GL state that the renderer sets, each a comparable value with the calls that
-// query and apply it, for GlShadow.
+// GlStateValues.h: the parts of GL state that the renderer sets. For each, a comparable value and the
+// functions that query and apply it, for GlShadow.
 #pragma once
 
 #include "moka/renderer/gles/GlFunctions.h"
@@ -19,7 +19,7 @@ struct GlFrameBuffersAccess {
 };
 using GlBoundFrameBuffers = GlFrameBuffersAccess::Value;
 
-// In pixels of the frame buffer, from GL's origin.
+// A rectangle in pixels of the frame buffer, from GL's origin (bottom left).
 struct GlBox {
     GLint x = 0, y = 0, width = 0, height = 0;
     friend bool operator==(GlBox const& a, GlBox const& b) {
@@ -71,9 +71,8 @@ struct GlDepthStencilMaskAccess {
 };
 inline constexpr GlDepthStencilMaskAccess::Value kGlAllDepthStencil{GL_TRUE, 0xFFu, 0xFFu};
 
-// Switches that must be off for all work of the renderer, a bit for each that is on: nothing is culled,
-// dithered, offset, covered by samples, or thrown away before the rasterizer, nor tested for depth unless a
-// state asks.
+// GL switches that must be off while the renderer draws, one bit for each that is on: culling, dithering,
+// polygon offset, sample coverage, rasterizer discard, and the depth test unless a state enables it.
 struct GlObstaclesAccess {
     using Value = unsigned;
     static constexpr Value kDepthTest = 1u;
@@ -100,10 +99,10 @@ struct GlProgramAccess {
 };
 
 struct GlBlendAccess {
-    // While blending is off the rest is of no interest and stays zero.
+    // While blending is off, the factors stay zero, so that all such values are equal.
     struct Value {
         bool on = false;
-        GLenum color[2] = {}; // the factors of source and destination; the two are added
+        GLenum color[2] = {}; // the factors of source and destination
         GLenum alpha[2] = {};
 
         friend bool operator==(Value const& a, Value const& b) {
@@ -117,7 +116,7 @@ using GlBlend = GlBlendAccess::Value;
 
 // The stencil test of both faces.
 struct GlStencilAccess {
-    // While the test is off the rest is of no interest and stays zero.
+    // While the test is off, the other members keep their defaults, so that all such values are equal.
     struct Value {
         bool on = false;
         GLenum comparison = GL_NONE;
@@ -149,15 +148,15 @@ struct GlArrayBufferAccess {
     static void Apply(Value value, Value const* known);
 };
 
-// The general binding, not the numbered ones.
+// The general uniform buffer binding, not the indexed ones.
 struct GlUniformBufferAccess {
     using Value = GLuint;
     static Value Query();
     static void Apply(Value value, Value const* known);
 };
 
-// How pixels lie in memory, as far as it concerns two-dimensional transfers. The default values are GL's own;
-// the renderer leaves them behind after each transfer.
+// The pixel store parameters of two-dimensional transfers. The default values are those of GL. The renderer
+// restores them after each transfer.
 struct GlPixelStore {
     GLuint buffer = 0;
     GLint alignment = 4;
@@ -171,7 +170,7 @@ struct GlPixelStore {
     }
 };
 
-// The names of one direction.
+// The GL names of the parameters for uploads, and below for read-backs.
 struct GlUnpackNames {
     static constexpr GLenum kBuffer = GL_PIXEL_UNPACK_BUFFER;
     static constexpr GLenum kAlignment = GL_UNPACK_ALIGNMENT;
@@ -188,7 +187,7 @@ struct GlPackNames {
     static constexpr GLenum kSkipPixels = GL_PACK_SKIP_PIXELS;
 };
 
-// For GlShadow. There is no query: external GL finds GL's defaults again, not its own values.
+// For GlShadow. It has no Query(): after a transfer external GL finds GL's defaults, not its previous values.
 template <class Names>
 struct GlPixelStoreAccess {
     using Value = GlPixelStore;

@@ -17,7 +17,7 @@ void GlSubmitter::Submit(DrawList const& list) {
     }
 }
 
-// The draws are those requested since the last flush.
+// Returns the name of the debug group, with the number of draws requested since the last flush.
 std::string GlSubmitter::DescribeFlush(DrawList const& list) {
     Counters const& counters = mDevice.counters;
     std::uint64_t const draws = counters.drawRequests - mDescribedRequests;
@@ -59,7 +59,7 @@ void GlSubmitter::Execute(Run const& run) {
 void GlSubmitter::Apply(RunState const& state) {
     TargetRef const& target = state.target;
     mDevice.host.BindTarget(target.frameBuffer, target.width, target.height);
-    // A buffer that nothing reads or writes may stay attached or not.
+    // Without a stencil or depth test it does not matter which buffer is attached.
     if (target.texture != 0 && (state.depthStencil.IsStencil() || state.depthStencil.IsDepth())) {
         mDevice.frameBuffers.Attach(target);
     }
@@ -93,7 +93,7 @@ void GlSubmitter::Execute(TextureClear const& clear) {
     ClearColor(transparent);
 }
 
-// Unlike glClear, glClearBuffer needs no clear colour, which external GL may have set for itself.
+// Uses glClearBuffer, which does not change the clear colour of external GL, as glClear would.
 void GlSubmitter::ClearColor(GLfloat const* color) {
     GlOverride<GlObstaclesAccess> const obstacles(mDevice.state.obstacles, 0);
     GlOverride<GlColorMaskAccess> const mask(mDevice.state.colorMask, kGlAllColors);
@@ -116,7 +116,7 @@ void GlSubmitter::Execute(DepthStencilClear const& clear) {
     ++mDevice.counters.clears;
 }
 
-// A frame buffer object and the default frame buffer have different names for their parts.
+// GL names the attachments of a frame buffer object and of the default frame buffer differently.
 void GlSubmitter::Execute(Discard const& discard) {
     bool const isObject = discard.target.frameBuffer != 0;
     GLenum parts[3] = {};
@@ -138,7 +138,7 @@ void GlSubmitter::Execute(TargetCopy const& copy) {
         GlEditTexture const edit(mDevice.state, copy.to.texture);
         Gl::CopyTexSubImage2D(GL_TEXTURE_2D, 0, 0, 0, 0, 0, copy.width, copy.height);
     } else {
-        // A texture copy cannot invent alpha; a blit reads it as 1.
+        // glCopyTexSubImage2D fails if the source lacks alpha. A blit reads alpha as 1.
         Blit(copy.from, copy.to, copy.width, copy.height);
     }
     ++mDevice.counters.copies;
@@ -149,7 +149,7 @@ void GlSubmitter::BeginCopy() {
     if (mDevice.workarounds.Needs(GlWorkaround::FinishBeforeCopies)) Gl::Finish();
 }
 
-// A host may bind another surface under the same name, so the answer cannot be kept. It is cheap beside the
+// Not cached, because a host may bind another surface under the same name. The query is cheap next to the
 // copy.
 bool GlSubmitter::HasAlpha(TargetRef const& target) {
     if (target.texture != 0) return true;
@@ -171,7 +171,7 @@ void GlSubmitter::Execute(MipmapUpdate const& update) {
     mDevice.UpdateMipmap(update.texture);
 }
 
-// Of all state, only the scissor test holds for a blit.
+// The scissor test is the only state that affects a blit.
 void GlSubmitter::Blit(TargetRef const& from, TargetRef const& to, int width, int height) {
     mDevice.host.Bind({to.frameBuffer, from.frameBuffer});
     GlOverride<GlScissorTestAccess> const scissor(mDevice.state.scissorTest, false);

@@ -1,4 +1,4 @@
-// GlSubmitter: makes GL execute a draw list, in order, with as few calls as the state cache allows.
+// GlSubmitter: executes the commands of a draw list in order, with as few GL calls as the state cache allows.
 // Thread: render thread.
 #pragma once
 
@@ -38,7 +38,7 @@ private:
 
     GlDevice& mDevice;
     DrawList const* mList = nullptr;
-    RunState const* mApplied = nullptr; // null after anything but a run
+    RunState const* mApplied = nullptr; // the state of the last command; null unless it was a run
     std::uint64_t mDescribedRequests = 0;
 };
 

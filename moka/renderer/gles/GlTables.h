@@ -1,4 +1,4 @@
-// GlTables.h: the renderer's numbers as GL's. GL_NONE stands for "names nothing".
+// GlTables.h: maps the renderer's enumerations to GL's. GL_NONE marks an unknown value.
 #pragma once
 
 #include "moka/renderer/BlendStateDescriptor.h"
@@ -34,7 +34,7 @@ constexpr GLenum ToGlWrap(TextureParamWrappingValue value) {
     return GL_NONE;
 }
 
-// Unknown for the types that no parameter has.
+// Returns BindingTypeUnknown for unsupported types.
 constexpr BindingType ToBindingType(GLenum uniformType) {
     switch (uniformType) {
     case GL_BOOL:
@@ -137,7 +137,7 @@ inline GlStencil ToGlStencil(DepthStencilStateDescriptor const& descriptor) {
             ToGlStencilOperation(descriptor.GetPass())};
 }
 
-// The one format there is; PixelBlock has its size in bytes.
+// The only pixel format. kBytesPerPixel is its size.
 inline constexpr GLenum kGlInternalFormat = GL_RGBA8;
 inline constexpr GLenum kGlFormat = GL_RGBA;
 inline constexpr GLenum kGlType = GL_UNSIGNED_BYTE;

@@ -16,7 +16,7 @@ std::size_t CountIntegers(ProgramLayout const& layout) {
     return (layout.integersEnd - layout.integersBegin) / sizeof(std::int32_t);
 }
 
-// Every bit of Run::varying that an integer of the program has.
+// Returns Run::varying with the bits of all integers of the program set.
 std::uint32_t AllVarying(ProgramLayout const& layout) {
     return static_cast<std::uint32_t>((std::uint64_t{1} << CountIntegers(layout)) - 1);
 }
@@ -36,7 +36,7 @@ GlVariants::GlVariants(GlState& state, GlDebug const& debug, char const* label, 
 GlVariants::~GlVariants() {
     for (Variant const& variant : mVariants) {
         if (variant.name == 0) continue;
-        // A current program would survive its deletion.
+        // GL keeps a deleted program alive while it is current.
         if (mState.program.Get() == variant.name) mState.program.Set(0);
         Gl::DeleteProgram(variant.name);
         --mState.counters.variants;
@@ -69,7 +69,7 @@ std::size_t GlVariants::Find(std::uint32_t varying, unsigned char const* values)
     for (std::size_t i = 0; i < mVariants.size(); ++i) {
         if (IsFor(mVariants[i], varying, values)) return i;
     }
-    // The last place is for the variant that has no constants.
+    // The last entry is reserved for the variant without constants.
     std::uint32_t const all = AllVarying(mLayout);
     if (varying != all && mVariants.size() + 1 >= kMost) return Find(all, values);
     Variant variant{};

@@ -1,9 +1,11 @@
-// GlVariants: the variants of one program (GlslVariant.h), each linked when it pays.
-// A long run links its variant at once, a short one when it is seen again. Integers that a run does not vary are
-// constants, so a program has a variant for each of their values, up to a limit; then one that varies them all.
+// GlVariants: the variants of one program (GlslVariant.h). A variant is linked when it is likely to save
+// time: for a long run at once, for a short run when it occurs again.
+// Integers that do not vary in a run are constants of its variant. So a program has a variant for each
+// combination of their values, up to a limit. Beyond it, one variant reads all integers from the records.
 // Owner:  GlPrograms, with the program.
 // Thread: render thread.
-// Fails:  a program whose text is not understood or whose variant does not link has none, which is logged once.
+// Fails:  if the source cannot be rewritten or a variant does not link, the program has no variants. This is
+//         logged once.
 #pragma once
 
 #include "moka/renderer/device/DrawList.h"
@@ -19,7 +21,7 @@ class GlState;
 
 class GlVariants {
 public:
-    // The uniform buffer binding that variants read; the last one that every device has.
+    // The uniform buffer binding of the records: the last one that every OpenGL ES 3.0 device has.
     static constexpr GLuint kBinding = 23;
 
     GlVariants(GlState& state, GlDebug const& debug, char const* label, GlslStages sources,
@@ -29,10 +31,10 @@ public:
     GlVariants& operator=(GlVariants const&) = delete;
 
     ProgramLayout const& GetLayout() const { return mLayout; }
-    // The number of the variant for a run of more than one record; false to draw them one by one. values are the
-    // first record's. Links only while *budget is above 0.
+    // Sets *variant to the index of the variant for a run of several records. Returns false if the records
+    // must be drawn one by one. values are those of the first record. Links only while *budget is above 0.
     bool Choose(Run const& run, unsigned char const* values, int* budget, std::size_t* variant);
-    // Makes it current. values are any record's, for the texture units.
+    // Makes the variant current. values are those of any record of the run; they supply the texture units.
     void Use(std::size_t variant, unsigned char const* values);
 
 private:
@@ -41,11 +43,11 @@ private:
 
     struct Variant {
         std::uint32_t varying;
-        std::vector<std::int32_t> integers; // of use where they do not vary
+        std::vector<std::int32_t> integers; // the constants; ignored where they vary
         int sightings;
         GLuint name;                           // 0 until it is linked
         std::vector<GLint> samplers;           // locations, in the program's order
-        std::array<GLint, kMaxSamplers> units; // that GL has for them
+        std::array<GLint, kMaxSamplers> units; // the texture units that GL has for them
     };
 
     bool IsFor(Variant const& variant, std::uint32_t varying, unsigned char const* values) const;

@@ -17,7 +17,7 @@ int GlVertexFormats::Find(VertexDescriptor const& descriptor) {
     return static_cast<int>(mFormats.size()) - 1;
 }
 
-// A whole new store each time, so that the driver need not wait for the draws that read the old one.
+// Allocates a new data store each time, so that the driver need not wait for draws that read the old one.
 void GlVertexFormats::Upload(VertexBuffer const& vertices) {
     if (mBuffer == 0) {
         Gl::GenBuffers(1, &mBuffer);

@@ -1,5 +1,5 @@
-// GlVertexFormats: one vertex array for each layout of vertices in use, all over one buffer that every submission
-// fills anew.
+// GlVertexFormats: one vertex array for each vertex layout. All use one vertex buffer, which every submission
+// fills again.
 // Thread: render thread.
 #pragma once
 
@@ -17,15 +17,15 @@ class GlVertexFormats {
 public:
     explicit GlVertexFormats(GlState& state) : mState(state) {}
 
-    // The number of the layout, the same for equal ones. Nothing is made in GL yet.
+    // Returns the index of the layout; equal layouts have the same one. Makes no GL call.
     int Find(VertexDescriptor const& descriptor);
 
-    // Within an operation: replaces the buffer's contents.
+    // Replaces the buffer's contents.
     void Upload(VertexBuffer const& vertices);
-    // Within an operation: draws read the buffer in this layout.
+    // Makes draws read the buffer in this layout.
     void Bind(int format);
-    // The same, with vertex 0 of a draw at vertex first of the buffer, and a number for each vertex at
-    // GlslVariant's location, from numbers on.
+    // Like Bind, but vertex 0 of a draw is vertex `first` of the buffer. Each vertex also reads its record
+    // number from numberBuffer, starting at index `numbers`, at location kRecordLocation.
     void BindNumbered(int format, int first, GLuint numberBuffer, std::size_t numbers);
 
     void Clear();
@@ -35,7 +35,7 @@ private:
         VertexDescriptor descriptor;
         GLuint vertexArray = 0;
         GLuint numberedArray = 0;
-        int first = 0; // vertex that the numbered array begins at
+        int first = 0; // the first vertex of the numbered array
         std::size_t numbers = 0;
     };
 

@@ -9,17 +9,17 @@ namespace Moka::detail {
 namespace {
 
 struct Row {
-    char const* renderer; // how the driver's GL_RENDERER begins
+    char const* renderer; // the beginning of the driver's GL_RENDERER
     GlWorkaround what;
     char const* cause;
     char const* cure;
 };
 
-// llvmpipe copies texels with the CPU once no queued scene writes them. It looks at one scene only, the oldest
-// that names the texture: where that one samples it, a later one that draws into it is overlooked, and the
-// copy has the old texels. Seen with Mesa 22.3 in every repetition, as soon as it has threads of its own
-// (LP_NUM_THREADS above 0). A read-back looks at the bound draw frame buffer as well; a copy has another one
-// bound. Flushing, binding the texture anew or attaching it anew does not help.
+// llvmpipe copies texels on the CPU when no queued scene writes them. It checks only the oldest scene that
+// uses the texture. If that scene samples the texture, a later one that draws into it is missed, and the copy
+// contains the old texels. Seen with Mesa 22.3 in every repetition if LP_NUM_THREADS is above 0. A read-back
+// also checks the bound draw frame buffer; during a copy another one is bound. Flushing, or binding or
+// attaching the texture again, does not help.
 constexpr Row kTable[] = {
     {"llvmpipe", GlWorkaround::BindForDrawingToRead,
      "glReadPixels misses draws into a texture that older draws still sample",

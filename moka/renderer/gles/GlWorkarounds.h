@@ -1,6 +1,6 @@
-// GlWorkarounds: faults of drivers and how the renderer avoids them: one table of rows, in the source
-// file, with driver, cause and cure.
-// Owner:  the context, which reads GL_RENDERER once.
+// GlWorkarounds: the driver faults that the renderer works around. The source file has one table of them,
+// with driver, cause and cure.
+// Owner:  the device, which reads GL_RENDERER once.
 // Thread: render thread.
 #pragma once
 
@@ -14,7 +14,7 @@ enum class GlWorkaround : unsigned {
 
 class GlWorkarounds {
 public:
-    // Those that the driver of the current context needs; logs a line of debug priority for each.
+    // Selects the workarounds for the driver of the current context. Logs each with debug priority.
     GlWorkarounds();
 
     bool Needs(GlWorkaround what) const { return (mNeeded & BitOf(what)) != 0; }

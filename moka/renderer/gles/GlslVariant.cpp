@@ -12,7 +12,7 @@ namespace {
 
 using Kind = GlslToken::Kind;
 
-// Thrown and caught in this file: how deep in a text something is found does not matter to who asked.
+// Thrown where a source cannot be rewritten. MakeGlslVariant catches it.
 struct NotUnderstood {
     std::string reason;
 };
@@ -29,7 +29,7 @@ bool IsPrecision(std::string_view word) {
     return IsOneOf(word, kWords);
 }
 
-// What this file changes must not come out of a macro or out of one branch of a condition.
+// The words that this file rewrites. They must not occur in a macro or inside an #if.
 bool IsStructural(std::string_view word) {
     static constexpr char const* kWords[] = {"uniform", "attribute",   "varying",     "in",
                                              "out",     "main",        "precision",   "gl_FragColor",
@@ -37,7 +37,7 @@ bool IsStructural(std::string_view word) {
     return IsOneOf(word, kWords);
 }
 
-// Not understood wherever they stand.
+// Sources that contain these words cannot be rewritten.
 bool IsForeign(std::string_view word) {
     static constexpr char const* kWords[] = {"gl_VertexID", "gl_InstanceID", "gl_FragData", "__VERSION__"};
     return IsOneOf(word, kWords) || word.substr(0, 4) == "moka" || word.substr(0, 4) == "Moka";
@@ -78,7 +78,7 @@ char const* GetTypeName(BindingType type) {
 
 bool IsIntegral(BindingType type) { return type == BindingTypeBool || type == BindingTypeInt; }
 
-// A uniform of the program in the order of the record.
+// A uniform of the program. Fields are in the order of the record.
 struct Field {
     ProgramLayout::Uniform const* uniform;
     bool isConstant;
@@ -101,7 +101,7 @@ std::vector<Field> ListFields(GlslVariantRequest const& request) {
     return fields;
 }
 
-// One stage, rewritten token by token. Lines keep their numbers.
+// Rewrites one stage token by token. Line numbers stay the same.
 class StageRewriter {
 public:
     StageRewriter(std::string_view source, bool isVertex, std::vector<Field> const& fields)
@@ -117,7 +117,7 @@ public:
     std::string const& GetExtensions() const { return mExtensions; }
     bool WritesFragColor() const { return mWritesFragColor; }
     int GetVaryings() const { return mVaryings; }
-    // Fields that the stage declares.
+    // The fields that the stage declares.
     std::vector<Field const*> const& GetUsed() const { return mUsed; }
 
 private:
@@ -198,8 +198,8 @@ private:
         ++mAt;
     }
 
-    // A declaration hands on one vector, or a matrix's columns, for each name. What is unusual is left to the
-    // linker.
+    // Counts one vector for each declared name, or one for each column of a matrix. Other types are left to
+    // the linker to check.
     void CountVarying(std::string_view word) {
         if (!mIsVertex || word != (mIsOld ? "varying" : "out")) return;
         int vectors = 1;
@@ -254,7 +254,7 @@ private:
     void Declare(std::string const& precision, std::string const& type, std::string const& name) {
         auto const found = std::find_if(mFields.begin(), mFields.end(),
                                         [&](Field const& field) { return field.uniform->name == name; });
-        // The compiler has removed the others.
+        // Uniforms that are not found are unused; the compiler has removed them.
         if (found != mFields.end() && found->isConstant) {
             std::string const value =
                 type == "bool" ? (found->value != 0 ? "true" : "false") : std::to_string(found->value);
@@ -280,8 +280,8 @@ private:
     bool mHasMain = false;
     bool mWritesFragColor = false;
     bool mStartsStatement = true;
-    int mConditions = 0; // that are open
-    int mDepth = 0;      // of brackets
+    int mConditions = 0; // open #if directives
+    int mDepth = 0;      // open brackets
     int mVaryings = 0;
     std::vector<Field const*> mUsed;
 };
@@ -314,7 +314,7 @@ std::string MakeVertexStage(StageRewriter const& stage, StageRewriter const& fra
 
 std::string MakeFragmentStage(StageRewriter const& stage) {
     std::string text = "#version 300 es\n" + stage.GetExtensions();
-    // As precise as gl_FragColor.
+    // gl_FragColor has the same precision.
     if (stage.WritesFragColor()) text += "layout(location = 0) out mediump vec4 mokaFragColor;\n";
     text += "#line 1\n" + stage.GetBody() + "\nvoid main() {\n";
     for (Field const* field : stage.GetUsed()) text += Assign(*field, "moka_" + field->uniform->name);

@@ -1,12 +1,13 @@
-// GlslVariant.h: rewrites the text of a program so that its uniforms become values that differ from vertex to
-// vertex: the vertex stage reads them from an array of records in a uniform block, by a number that each vertex
-// has, and hands the uniforms of the fragment stage on as flat inputs. Samplers stay uniforms. No GL is needed.
+// GlslVariant.h: rewrites the source of a program so that its uniforms may differ between vertices. The
+// vertex stage reads them from an array of records in a uniform block, indexed by a number of the vertex. It
+// passes the uniforms of the fragment stage on as flat varyings. Samplers stay uniforms. This file needs no
+// GL.
 //
 //     uniform highp float uRadius;    becomes, in the fragment stage,
 //     flat in highp float moka_uRadius; highp float uRadius;
 //
-// and a new main() copies the one to the other before it calls the program's own. So names that hide a uniform
-// keep hiding it.
+// and a new main() copies the varying to the variable before it calls the program's own main(). Local names
+// that hide a uniform therefore keep hiding it.
 #pragma once
 
 #include "moka/renderer/device/ProgramLayout.h"
@@ -19,11 +20,11 @@
 namespace Moka::detail {
 
 inline constexpr char kRecordBlock[] = "MokaRecords";
-// Of the vertices' numbers; the last one that every device has.
+// The attribute location of the record number: the last one that every OpenGL ES 3.0 device has.
 inline constexpr unsigned kRecordLocation = 15;
-// Bytes of the block that every device has room for.
+// The size of a uniform block that every device supports.
 inline constexpr std::size_t kBlockBytes = std::size_t{16} * 1024;
-// Vectors from stage to stage that every device has room for.
+// The number of varying vectors that every device supports.
 inline constexpr int kMostVaryings = 15;
 
 struct GlslStages {
@@ -34,19 +35,21 @@ struct GlslStages {
 struct GlslVariantRequest {
     GlslStages const& sources; // GLSL ES 1.00 or 3.00
     ProgramLayout const& layout;
-    std::uint32_t varying; // as Run has it
-    // Of all ints and bools, in the order of their offsets. Those that do not vary become constants.
+    std::uint32_t varying; // Run::varying
+    // The values of all ints and bools, in the order of their offsets. Those that do not vary become
+    // constants.
     std::vector<std::int32_t> const& integers;
 };
 
-// The text with highp in place of lower precisions.
+// Returns the source with lower precisions replaced by highp.
 std::string MakeGlslHighp(std::string_view source);
 
-// Bytes from one record to the next: std140 of the program's values up to the texture units.
+// The bytes from one record to the next: the std140 size of the program's values without the texture units.
 std::size_t GetRecordStride(ProgramLayout const& layout);
 std::size_t GetRecordsPerBlock(ProgramLayout const& layout);
 
-// GLSL ES 3.00. Nothing, with the reason, for a text that is not understood well enough.
+// Returns the variant in GLSL ES 3.00. If a source contains something that this file cannot rewrite, returns
+// nothing and sets *reason.
 std::optional<GlslStages> MakeGlslVariant(GlslVariantRequest const& request, std::string* reason);
 
 } // namespace Moka::detail

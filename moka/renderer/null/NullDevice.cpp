@@ -11,7 +11,7 @@
 namespace Moka::detail {
 namespace {
 
-// As GL converts: clamped, rounded to the nearest; not a number counts as 0.
+// Converts as GL does: clamps and rounds to nearest. NaN becomes 0.
 unsigned char ToByte(float value) {
     if (!(value > 0)) return 0;
     return static_cast<unsigned char>(std::lround(std::min(value, 1.0f) * 255.0f));
@@ -164,7 +164,7 @@ void NullDevice::Execute(ColorClear const& clear) {
 
 void NullDevice::Execute(DepthStencilClear const&) { ++mCounters.clears; }
 
-// Texels are zero from the beginning.
+// New textures are already zero.
 void NullDevice::Execute(TextureClear const&) {}
 
 void NullDevice::Execute(Discard const&) {}
@@ -175,7 +175,7 @@ void NullDevice::Execute(TextureDraw const& draw) {
     Copy(draw.from, draw.to, draw.from.width, draw.from.height);
 }
 
-// Nothing is sampled.
+// Nothing samples the levels, so they are not generated.
 void NullDevice::Execute(MipmapUpdate const&) { ++mCounters.mipmapUpdates; }
 
 void NullDevice::Copy(TargetRef const& from, TargetRef const& to, int width, int height) {

@@ -1,5 +1,6 @@
-// NullDevice: a device without a driver. Images live in memory: uploads, read-backs, copies and clears are real.
-// Draws are counted and draw nothing. For tests of a caller's logic, CPU cost without a driver, and threads.
+// NullDevice: a device without a driver. Images are in memory, and uploads, read-backs, copies and clears
+// work. Draws are counted and draw nothing. Use it to test a caller's logic and threads, and to measure CPU
+// cost without a driver.
 // Thread: render thread.
 #pragma once
 
@@ -18,7 +19,7 @@ struct NullImage {
 
     void Resize(int w, int h);
     unsigned char* At(int x, int y);
-    // What x, y, width, height has inside the image gets the colour.
+    // Fills the part of rect that lies inside the image.
     void Fill(ScissorRect const& rect, std::array<float, 4> const& color);
 };
 
@@ -52,7 +53,8 @@ public:
     void DeleteSamplers() override {}
 
 protected:
-    // The texture's image, or the one host frame buffer that there is, which grows with its targets.
+    // Returns the texture's image, or the image of the host's only frame buffer, which grows to the size of
+    // its targets.
     NullImage& GetImage(TargetRef const& target);
     virtual void Execute(Discard const& discard);
     virtual void Execute(TextureClear const& clear);
@@ -70,7 +72,7 @@ private:
     DeviceName mLastName = 0; // of any kind
     std::unordered_map<DeviceName, NullImage> mTextures;
     NullImage mHost;
-    ScissorState mScissor; // as committed, which is all that a query can find
+    ScissorState mScissor; // the last committed state, for queries
     std::vector<VertexDescriptor> mFormats;
 };
 

@@ -9,8 +9,9 @@
 namespace Moka::detail {
 namespace {
 
-// Callers keep the pointers for the life of the process, so the strings are never freed; a set, because
-// contexts of one driver repeat them. Render threads come one after the other: no lock.
+// Callers may keep the pointers until the process ends, so the strings are never freed. The set stores each
+// text once, however many contexts one driver creates. No lock: at most one render thread is attached at a
+// time.
 char const* Intern(std::string const& text) {
     static auto& strings = *new std::set<std::string>;
     return strings.insert(text).first->c_str();

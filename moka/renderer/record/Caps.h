@@ -1,5 +1,5 @@
-// RecorderCaps: the capabilities of the device that is attached, or was attached last.
-// Thread: Set on the render thread; the rest anywhere, also while another context is being attached.
+// RecorderCaps: the capabilities of the attached device, or of the last one after it was detached.
+// Thread: Set() runs on the render thread. Any thread may call the getters, also while a context is attached.
 #pragma once
 
 #include "moka/renderer/IRendererDeviceCaps.h"

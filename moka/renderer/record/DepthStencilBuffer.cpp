@@ -18,7 +18,7 @@ DepthStencilBuffer::~DepthStencilBuffer() { --mRecorder->counters.depthStencilBu
 
 void DepthStencilBuffer::Release() {
     Observe(ObjectKind::kDepthStencilBuffer, this, "Release");
-    // Outlives this object.
+    // Keeps the recorder alive after `delete this`.
     std::shared_ptr<Recorder> const recorder = mRecorder;
     RequestScope const scope(*recorder);
     if (mTarget) mTarget->ForgetDepthStencil();

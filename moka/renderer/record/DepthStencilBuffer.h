@@ -1,5 +1,5 @@
-// DepthStencilBuffer: a depth-stencil buffer as the factory hands it out. The device's buffer comes from the
-// pool and returns there.
+// DepthStencilBuffer: the factory's implementation of IDepthStencilBuffer. Its device buffer comes from the
+// DepthStencilPool and returns there on release.
 #pragma once
 
 #include "moka/renderer/IDepthStencilBuffer.h"
@@ -14,7 +14,7 @@ class RenderTarget;
 
 class DepthStencilBuffer final : public IDepthStencilBuffer {
 public:
-    // Adopts a name that the pool gave.
+    // Takes ownership of name, which DepthStencilPool::Take returned.
     DepthStencilBuffer(std::shared_ptr<Recorder> recorder, DeviceName name, int width, int height);
     DepthStencilBuffer(DepthStencilBuffer const&) = delete;
     ~DepthStencilBuffer();
@@ -27,7 +27,7 @@ public:
     int GetWidth() const { return mWidth; }
     int GetHeight() const { return mHeight; }
 
-    // The target it is attached to, or null; RenderTarget keeps it current.
+    // The target that this buffer is attached to, or null. RenderTarget updates it.
     RenderTarget* GetTarget() const { return mTarget; }
     void SetTarget(RenderTarget* target) { mTarget = target; }
 

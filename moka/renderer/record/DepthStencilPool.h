@@ -1,5 +1,5 @@
-// DepthStencilPool: the device's depth-stencil buffers, kept by size when they are returned, because clips take
-// and return one on every draw.
+// DepthStencilPool: keeps returned depth-stencil buffers for the next request of the same size, because a
+// stencil clip takes and returns one on every draw.
 // Thread: render thread, within a request.
 #pragma once
 
@@ -15,14 +15,14 @@ class DepthStencilPool {
 public:
     explicit DepthStencilPool(Recorder& recorder) : mRecorder(recorder) {}
 
-    // Any contents; 0 when the device has no memory.
+    // The contents are undefined. Returns 0 if the device is out of memory.
     DeviceName Take(int width, int height);
-    // If the pool is full, the oldest buffer is deleted, after a flush if the list may use it.
+    // If the pool is full, this deletes the oldest buffer, and flushes first if the list may use it.
     void Return(DeviceName name, int width, int height);
     void Clear();
 
 private:
-    // Enough for a few canvases that clip in turn; each buffer of screen size holds some ten megabytes.
+    // Enough for a few canvases that clip in turn. A buffer of screen size takes about 10 MB.
     static constexpr std::size_t kMaxWaiting = 4;
 
     struct Entry {

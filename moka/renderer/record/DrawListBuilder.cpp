@@ -10,7 +10,7 @@
 namespace Moka::detail {
 namespace {
 
-// A bit for each integer whose values differ.
+// Returns one bit for each integer uniform whose value differs between a and b.
 std::uint32_t FindVarying(unsigned char const* a, unsigned char const* b, ProgramLayout const& layout) {
     std::uint32_t varying = 0;
     std::uint32_t bit = 1;
@@ -39,7 +39,7 @@ void DrawListBuilder::AddVertices(float const* vertices, int count, int stride, 
     mEndVertex += count;
 }
 
-// Draws of one format leave no gap.
+// Pads the list to a multiple of the stride. Draws of one format leave no gap.
 void DrawListBuilder::Align(std::size_t stride) {
     VertexBuffer& floats = mList.vertices;
     std::size_t const end = (floats.size() + stride - 1) / stride;
@@ -126,7 +126,7 @@ std::size_t DrawListBuilder::AddValues(ProgramState& program) {
 }
 
 DrawListBuilder::OpenRun* DrawListBuilder::FindRun(std::size_t state, DrawBounds const& bounds) {
-    // Joined strips would be connected by triangles that nobody asked for.
+    // Joined triangle strips would be connected by unwanted triangles.
     if (mList.states[state].primitive != PrimitiveType::TriangleList) return nullptr;
     if (mRunCount > mFirstOpenRun && mRuns[mRunCount - 1].state == state) return &mRuns[mRunCount - 1];
     return mMerges ? FindEarlierRun(state, bounds) : nullptr;
@@ -136,7 +136,7 @@ DrawListBuilder::OpenRun* DrawListBuilder::FindEarlierRun(std::size_t state, Dra
     for (std::size_t i = mRunCount; i > mFirstOpenRun && mRunCount - i < kReach; --i) {
         OpenRun& run = mRuns[i - 1];
         if (run.state == state) return &run;
-        // Another target's texture may be sampled by what lies between.
+        // A run in between may sample the texture of the other target.
         bool const hasOneTarget =
             mList.states[run.state].target.frameBuffer == mList.states[state].target.frameBuffer;
         if (!hasOneTarget || MayTouch(run, bounds)) return nullptr;
@@ -144,7 +144,7 @@ DrawListBuilder::OpenRun* DrawListBuilder::FindEarlierRun(std::size_t state, Dra
     return nullptr;
 }
 
-// The draws since the last question are added first: most runs are never asked.
+// Bounds are added lazily, because most runs are never tested.
 bool DrawListBuilder::MayTouch(OpenRun& run, DrawBounds const& bounds) {
     for (; run.unbounded != kEnd; run.unbounded = mDraws[run.unbounded].next) {
         run.bounds.Add(mDraws[run.unbounded].bounds);
@@ -159,7 +159,7 @@ bool DrawListBuilder::Continues(OpenRun const& run, ProgramLayout const& layout,
     how.isSame = last.values == record.values;
     if (!how.isNext && (!mMerges || run.vertices + record.count > kMostGathered)) return false;
     if (how.isSame) return true;
-    // Run::varying has so many bits.
+    // Run::varying has one bit for each integer.
     std::size_t const integers = layout.integersEnd - layout.integersBegin;
     if (!mMerges || integers > 32 * sizeof(std::int32_t)) return false;
     if (integers == 0) return true;
@@ -209,7 +209,7 @@ void DrawListBuilder::OpenNewRun(std::size_t state, Record const& record, DrawBo
 }
 
 std::uint32_t DrawListBuilder::AddRecord(Record const& record, DrawBounds const& bounds) {
-    // Finish() needs no memory for them.
+    // Reserved here, so that Finish() need not allocate.
     if (mList.records.capacity() == mDraws.size()) mList.records.reserve(mDraws.size() * 2 + kReach);
     mDraws.push_back({record, bounds, kEnd});
     return static_cast<std::uint32_t>(mDraws.size() - 1);
@@ -246,14 +246,14 @@ void DrawListBuilder::FinishRun(OpenRun const& run) {
     if (!run.isContiguous) Gather(run, finished);
 }
 
-// The run's vertices are copied behind all others, in the order of its records.
+// Copies the run's vertices to the end of the list, in the order of its records.
 void DrawListBuilder::Gather(OpenRun const& run, Run& finished) {
     VertexBuffer& floats = mList.vertices;
     std::size_t const begin = (floats.size() + run.stride - 1) / run.stride * run.stride;
     try {
         floats.resize(begin + static_cast<std::size_t>(run.vertices) * run.stride);
     } catch (std::bad_alloc const&) {
-        return; // each record is drawn from where it lies
+        return; // each record is then drawn from its own place
     }
     int first = static_cast<int>(begin / run.stride);
     for (std::size_t i = 0; i < finished.recordCount; ++i) {
@@ -268,7 +268,8 @@ void DrawListBuilder::Gather(OpenRun const& run, Run& finished) {
     JoinEqualRecords(finished);
 }
 
-// Only the last run's records are there to be joined: others follow it later.
+// Joins neighbours with equal values among the records of the run that is finished last. Records of later
+// runs are appended afterwards.
 void DrawListBuilder::JoinEqualRecords(Run& finished) {
     std::vector<Record>& records = mList.records;
     std::size_t last = finished.firstRecord;

@@ -1,10 +1,10 @@
 // DrawListBuilder: records draws, clears and copies into a draw list and joins draws of one state into runs.
-// Knows which textures and programs the list uses.
-// A draw joins the last run of its state. Between the two only runs may lie whose draws it does not touch, so
-// that no pixel is drawn in another order.
+// It tracks which textures and programs the list uses.
+// A draw joins the latest run of its state, unless its bounds overlap those of a run in between: overlapping
+// draws keep their order.
 // Thread: render thread.
-// Cost:   the memory of the largest list is kept and used again, so a warm builder allocates nothing.
-// Fails:  bad_alloc; the list is then as it was before the call.
+// Cost:   the builder reuses the memory of the largest list, so once it is warm it does not allocate.
+// Fails:  throws bad_alloc. The list is then as it was before the call.
 #pragma once
 
 #include "moka/renderer/RendererStatistics.h"
@@ -20,7 +20,7 @@ struct Counters;
 class ProgramState;
 struct ProgramLayout;
 
-// Vertices that were handed over and lie in a list, or lay in it until it was flushed.
+// A range of vertices in the list with number `list`. The range is valid until that list is flushed.
 struct ListVertices {
     std::uint64_t list = 0;
     std::size_t offset = 0; // floats
@@ -29,14 +29,15 @@ struct ListVertices {
     int first = 0;          // offset in vertices
 };
 
-// Vertices to draw: count of them, from the first one on.
+// A draw of `count` vertices, starting with vertex `first`.
 struct ListDraw {
-    ListVertices const& vertices; // of the present list
+    ListVertices const& vertices; // in the current list
     int first;
     int count;
     DrawBounds bounds;
 };
 
+// A draw that is never joined to a run. Values and vertices are copied into the list.
 struct SeparateDraw {
     RunState const& state;
     unsigned char const* values;
@@ -50,25 +51,24 @@ class DrawListBuilder {
 public:
     explicit DrawListBuilder(Counters& counters) : mCounters(counters) {}
 
-    // Each draw is a run of its own, except where neither state nor values differ.
+    // With merging off, draws share a run only if state and values are equal.
     void SetMerging(bool on) { mMerges = on; }
 
-    // Places the vertices at a multiple of their stride (floats of one vertex). place says where; those that it
-    // named before are dropped if they lie at the end of the list and are not drawn.
+    // Copies the vertices to a multiple of their stride (in floats) and sets `place`. The vertices that
+    // `place` named before are removed if no draw uses them and they are the last ones in the list.
     void AddVertices(float const* vertices, int count, int stride, ListVertices& place);
     bool Has(ListVertices const& vertices) const { return vertices.list == mNumber; }
     float const* GetVertices(ListVertices const& vertices) const {
         return mList.vertices.data() + vertices.offset;
     }
 
-    // state is compared with those of the last runs unless isKnownSame as the last draw's; the program's values
-    // are copied if they changed.
+    // isKnownSame: the state equals that of the last draw, so no comparison is needed. The program's values
+    // are copied if they have changed.
     void AddDraw(RunState const& state, bool isKnownSame, ProgramState& program, ListDraw const& draw);
-    // A draw that shares its run with no other, of values and vertices that are copied.
     void AddSeparateDraw(SeparateDraw const& draw);
-    // Of a clear of the stencil or of a separate draw, by its place in the commands.
+    // Changes the scissor of a recorded stencil clear or separate draw. command is its index in the list.
     void SetScissor(std::size_t command, ScissorState const& scissor);
-    // Any command but a draw.
+    // Adds any command other than a draw.
     template <class Other>
     void Add(Other const& command) {
         UseTextures(command);
@@ -76,27 +76,28 @@ public:
         mFirstOpenRun = mRunCount;
     }
 
-    // Drops vertices that nobody draws if they are the last ones.
+    // Removes the vertices if no draw uses them and they are the last ones in the list.
     void DropVertices(ListVertices const& vertices);
 
-    // Numbers the lists from 1 on.
+    // The number of the current list. The first list is 1.
     std::uint64_t GetNumber() const { return mNumber; }
-    // Not complete before Finish().
+    // The list is incomplete until Finish().
     DrawList const& GetList() const { return mList; }
-    // Whether a command in the list reads or writes the texture.
+    // True if a command in the list reads or writes the texture.
     bool UsesTexture(DeviceName texture) const;
-    // The name means nothing any more; the list is empty.
+    // Call this when the texture is deleted, while the list is empty.
     void ForgetTexture(DeviceName texture) { mTextureUses.erase(texture); }
 
     bool IsEmpty() const { return mList.commands.empty(); }
-    // Large enough for the GPU to begin while the rest is recorded.
+    // True if the list is large enough to be flushed now, so that the GPU works while the CPU records the
+    // rest.
     bool IsFull() const {
         return mList.vertices.size() >= kFullFloats || mListedFloats >= 2 * kFullFloats ||
                mList.commands.size() >= kFullCommands || mList.uniforms.size() >= kFullBytes;
     }
-    // Complete: the runs' records and vertices are in their order.
+    // Completes the list: puts the records and vertices of each run in order.
     DrawList const& Finish();
-    // full: the list was flushed because it had no more room.
+    // full: the list was flushed because IsFull() was true.
     void Clear(bool full);
     std::uint64_t GetCapacityBytes() const;
 
@@ -104,11 +105,11 @@ private:
     static constexpr std::size_t kFullFloats = 1u << 18; // 1 MiB
     static constexpr std::size_t kFullBytes = 1u << 20;
     static constexpr std::size_t kFullCommands = 1u << 13;
-    // How many runs back a draw looks for one of its state.
+    // A draw searches at most this many of the latest runs for one of its state.
     static constexpr std::size_t kReach = 16;
-    // A run that so many draws share a constant in is worth keeping that constant.
+    // From this many draws on, a run keeps its constants: a draw with another value opens a new run.
     static constexpr int kLongRun = 32;
-    // Vertices of a run that are copied at most to make it contiguous.
+    // The most vertices that are copied to make one run contiguous.
     static constexpr int kMostGathered = 1 << 14;
     static constexpr std::uint32_t kEnd = ~std::uint32_t{0};
     static constexpr std::size_t kNoState = ~std::size_t{0};
@@ -129,15 +130,15 @@ private:
         int vertices;
         bool isContiguous;
         std::uint32_t varying;
-        RunBounds bounds;        // of the draws up to the one before
-        std::uint32_t unbounded; // the first draw that is not in bounds yet, or kEnd
+        RunBounds bounds;        // of the draws before `unbounded`
+        std::uint32_t unbounded; // the first draw that is not in `bounds` yet, or kEnd
     };
 
     // How a record follows the last one of a run.
     struct Continuation {
-        bool isNext = false;       // its vertices lie behind the last one's
-        bool isSame = false;       // it has the same values
-        std::uint32_t varying = 0; // a bit for each integer that differs
+        bool isNext = false;       // its vertices directly follow those of the last record
+        bool isSame = false;       // its values are equal
+        std::uint32_t varying = 0; // one bit for each integer that differs
     };
 
     bool IsUndrawnEnd(ListVertices const& vertices) const;
@@ -147,7 +148,7 @@ private:
     OpenRun* FindRun(std::size_t state, DrawBounds const& bounds);
     OpenRun* FindEarlierRun(std::size_t state, DrawBounds const& bounds);
     bool MayTouch(OpenRun& run, DrawBounds const& bounds);
-    // False: the record needs a run of its own.
+    // Returns false if the record needs a run of its own.
     bool Continues(OpenRun const& run, ProgramLayout const& layout, Record const& record,
                    Continuation& how) const;
     void Join(OpenRun& run, Record const& record, DrawBounds const& bounds, Continuation const& how);
@@ -174,17 +175,17 @@ private:
     bool mMerges = true;
     DrawList mList;
     std::vector<Draw> mDraws;
-    std::vector<OpenRun> mRuns; // the first mRunCount are of this list
+    std::vector<OpenRun> mRuns; // the first mRunCount belong to the current list
     std::size_t mRunCount = 0;
-    std::size_t mFirstOpenRun = 0;       // runs before it lie behind another command
-    RunEnd mFlushReason = RunEnd::Other; // why the list before this one ended
-    std::size_t mLastState = kNoState;   // of this list's last draw that was no separate one
-    std::size_t mDrawnFloats = 0;        // draws refer to vertices before it
-    std::size_t mEndStride = 0;          // the list's floats are a multiple of it: mEndVertex times
+    std::size_t mFirstOpenRun = 0;       // earlier runs are closed: another command follows them
+    RunEnd mFlushReason = RunEnd::Other; // why the previous list ended
+    std::size_t mLastState = kNoState;   // the state of the last draw; separate draws do not count
+    std::size_t mDrawnFloats = 0;        // draws use only vertices before this offset
+    std::size_t mEndStride = 0;          // the list's size in floats is mEndVertex times this
     int mEndVertex = 0;
-    // Of all draws: vertices that are drawn again may have to be copied.
+    // The vertices of all draws. One that is drawn twice counts twice, because gathering may copy it.
     std::size_t mListedFloats = 0;
-    // So that marks of earlier lists mean nothing in this one.
+    // ListVertices and ProgramState::Listed refer to lists by this number, so clearing invalidates them all.
     std::uint64_t mNumber = 1;
     std::unordered_map<DeviceName, std::uint64_t> mTextureUses; // the number of the last list that used it
 };

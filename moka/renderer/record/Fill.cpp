@@ -37,7 +37,7 @@ void Fill::Add(Recorder& recorder, TargetRef const& target, std::array<float, 4>
 
 void Fill::Make(Recorder& recorder) {
     mProgram = std::make_shared<ProgramState>(recorder.shared_from_this(), kVertex, kFragment, "moka fill");
-    --recorder.counters.programs; // counts those of the caller
+    --recorder.counters.programs; // the statistics count the programs of callers only
     mColor = mProgram->AddHandle("color");
     VertexDescriptor format;
     format.addAttribute(VertexAttributeType::Float, 2, -1, 0);

@@ -1,6 +1,6 @@
-// Fill: fills a target with one colour by drawing, for clears that must obey the stencil test, which GL's own
-// clear ignores.
-// Owner:  the recorder; the program is made when it is first needed and goes with the context.
+// Fill: clears a target to one colour by drawing. A clear under a stencil clip needs it, because glClear
+// ignores the stencil test.
+// Owner:  the recorder. The program is created at the first use and deleted with the context.
 // Thread: render thread.
 #pragma once
 

@@ -1,5 +1,5 @@
-// FlushTrace: a flush of the draw list as an event of a trace: the draws requested since the last one, and the
-// runs that reached the driver.
+// FlushTrace: traces one flush of the draw list, with the number of draws requested since the last flush and
+// the number of runs submitted to the driver.
 // Thread: render thread.
 #pragma once
 

@@ -1,6 +1,6 @@
-// FrameBuffer: what a render target draws into: a frame buffer over a texture's storage, or one that belongs to
-// the host and is never deleted.
-// Owner:  shared; a target made from the current frame buffer shares the active target's.
+// FrameBuffer: the frame buffer of a render target. It either has a texture's storage attached, or belongs to
+// the host; a frame buffer of the host is never deleted.
+// Owner:  shared. A target created from the current frame buffer shares that of the active target.
 // Thread: render thread.
 #pragma once
 
@@ -15,14 +15,15 @@ class TextureStorage;
 class FrameBuffer {
 public:
     explicit FrameBuffer(DeviceName hosts);
-    // Within a request: takes one of the storage's and returns it in the end. 0 when the device refuses.
+    // Call this within a request. Takes a frame buffer from the storage; the destructor returns it. GetName()
+    // is 0 if the device could not create one.
     explicit FrameBuffer(std::shared_ptr<TextureStorage> storage);
     ~FrameBuffer();
     FrameBuffer(FrameBuffer const&) = delete;
     FrameBuffer& operator=(FrameBuffer const&) = delete;
 
     DeviceName GetName() const { return mName; }
-    // Null for a host's.
+    // Null for a frame buffer of the host.
     TextureStorage* GetStorage() const { return mStorage.get(); }
 
 private:

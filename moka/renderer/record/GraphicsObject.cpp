@@ -38,13 +38,13 @@ void GraphicsObject::SetVertices(int stream, void const* data, int count) {
     try {
         HandOver(static_cast<float const*>(data), count);
     } catch (std::bad_alloc const&) {
-        // Nothing is drawn then.
+        // The object then has no vertices, and draws do nothing.
     }
 }
 
 void GraphicsObject::HandOver(float const* data, int count) {
     DrawListBuilder& list = mRecorder->list;
-    // Vertices that nobody draws do not pile up.
+    // Without this, vertices that no draw uses could grow the list without limit.
     if (list.IsFull()) mRecorder->Flush();
     list.AddVertices(data, count, mFloatsPerVertex, mPlace);
     if (mHeldList != mPlace.list) mRecorder->AddHolder(*this);
@@ -57,7 +57,7 @@ bool GraphicsObject::Draw(int first, int count, int instances) {
     RequestScope const scope(*mRecorder);
     if (!scope) return false;
     if (instances != 1) {
-        __android_log_print(ANDROID_LOG_ERROR, "mok_log", "a draw of %d instances is refused; 1 is drawn",
+        __android_log_print(ANDROID_LOG_ERROR, "mok_log", "a draw of %d instances is refused; pass 1",
                             instances);
         return false;
     }
@@ -73,7 +73,7 @@ bool GraphicsObject::Draw(int first, int count, int instances) {
     try {
         return mRecorder->Draw(*this, mFormat, mPrimitive, start, drawn);
     } catch (std::bad_alloc const&) {
-        // What was recorded before needs no more memory.
+        // Flushing the draws recorded so far needs no more memory.
         mRecorder->Flush();
         return false;
     }

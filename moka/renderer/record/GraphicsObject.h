@@ -1,5 +1,5 @@
-// GraphicsObject: vertices of one layout. They lie in the draw list from the hand-over on, and in memory of the
-// object once the list was flushed.
+// GraphicsObject: vertices of one layout. SetVertices copies them into the draw list; when the list is
+// flushed, the object keeps a copy.
 #pragma once
 
 #include "moka/renderer/IGraphicsObject.h"
@@ -18,7 +18,7 @@ class Recorder;
 
 class GraphicsObject final : public IGraphicsObject {
 public:
-    // Within a request.
+    // Call this within a request.
     GraphicsObject(std::shared_ptr<Recorder> recorder, PrimitiveType primitive,
                    VertexDescriptor const& descriptor);
     GraphicsObject(GraphicsObject const&) = delete;
@@ -31,14 +31,16 @@ public:
     void SetBounds(DrawBounds const& bounds) override;
 
     DrawBounds const& GetBounds() const { return mBounds; }
-    // Within a request: the vertices in the present list. Throws bad_alloc.
+    // Call this within a request. Copies the vertices into the current list unless they are there. Throws
+    // bad_alloc.
     ListVertices const& PlaceVertices();
-    // Null without vertices.
+    // Null if there are no vertices.
     float const* GetVertices() const;
     int GetStride() const { return mFloatsPerVertex; }
-    // The list does not need the vertices; the object keeps them.
+    // Moves the vertices from the list to the object. No draw of the list may use them.
     void TakeBackVertices() noexcept;
-    // The list is about to be cleared. Without memory the object has no vertices afterwards.
+    // Copies the vertices before the list is cleared. If memory runs out, the object has no vertices
+    // afterwards.
     void KeepVertices() noexcept;
 
 private:
@@ -51,8 +53,8 @@ private:
     int mCount = 0;
     DrawBounds mBounds;
     ListVertices mPlace;
-    std::uint64_t mHeldList = 0; // the list that calls KeepVertices
-    std::vector<float> mKept;    // used while the list does not have them; its memory is used again
+    std::uint64_t mHeldList = 0; // the list whose flush calls KeepVertices
+    std::vector<float> mKept;    // the vertices while they are in no list; its capacity is reused
 };
 
 } // namespace Moka::detail

@@ -1,9 +1,9 @@
-// Mipmaps: which textures have levels that show their contents, in the order of requests. A draw that samples
-// with TextureFilterMipmapped has the levels made before it unless they are here; whatever changes a texture
-// takes it out.
+// Mipmaps: the set of textures whose mipmap levels are current, in the order of requests. Before a draw that
+// samples with TextureFilterMipmapped, the recorder generates the levels of textures that are not in the set.
+// Each change of a texture removes it from the set.
 // Owner:  the recorder.
 // Thread: render thread, within a request.
-// Cost:   nothing while no texture is sampled so.
+// Cost:   nothing until a texture is sampled with TextureFilterMipmapped.
 #pragma once
 
 #include "moka/renderer/device/RunState.h"
@@ -14,10 +14,10 @@ namespace Moka::detail {
 
 class Mipmaps {
 public:
-    // False: the levels show older contents, or there are none.
+    // False if the levels are outdated or do not exist.
     bool IsCurrent(DeviceName texture) const { return mCurrent.count(texture) != 0; }
     void SetCurrent(DeviceName texture) { mCurrent.insert(texture); }
-    // The texture's contents change, or the texture goes.
+    // Call this when the texture's contents change or the texture is deleted.
     void Forget(DeviceName texture) {
         if (!mCurrent.empty()) mCurrent.erase(texture);
     }

@@ -1,8 +1,9 @@
-// RecorderObserver: sees every request to the renderer in the order of arrival, and may refuse creations. For
-// tests of the order of calls and of failing creations; null in every other program.
+// RecorderObserver: sees every request to the renderer in the order of arrival and can make creations fail.
+// Tests use it to check the order of calls and the handling of failures. Other programs leave theObserver
+// null.
 // Owner:  the test, which sets theObserver while no thread uses the renderer.
-// Thread: called on the thread that makes the request, before the request takes effect; a creation is reported
-//         after it, with the new object.
+// Thread: called on the thread that makes the request, before the request takes effect; a creation is
+//         reported after it, with the new object.
 #pragma once
 
 #include "moka/renderer/IGraphicsObject.h"
@@ -37,7 +38,7 @@ struct RequestValue {
     RequestValue(T value) : kind(Kind::Integer), integer(static_cast<long long>(value)) {}
     RequestValue(float value) : kind(Kind::Number), number(value) {}
     RequestValue(char const* value) : kind(Kind::Text), text(value) {}
-    // Of our interfaces; null is no object.
+    // A pointer to one of the renderer's interfaces, or null.
     RequestValue(void const* value) : kind(Kind::Object), object(value) {}
 
     Kind kind;
@@ -49,7 +50,7 @@ struct RequestValue {
 
 struct RendererRequest {
     ObjectKind kind;
-    void const* object; // the interface pointer that the caller has; null for static functions
+    void const* object; // the caller's interface pointer; null for static functions
     char const* operation;
     std::initializer_list<RequestValue> values;
 };
@@ -58,13 +59,13 @@ struct DrawRequest {
     RequestedState& state;
     void const* graphics;
     PrimitiveType primitive;
-    float const* vertices; // those that are drawn
+    float const* vertices; // the first drawn vertex
     int floatsPerVertex;
-    int first; // of the vertices that were handed over
+    int first; // its index among the vertices of SetVertices
     int count;
 };
 
-// Of a target, whichever is active.
+// A clear of `target`, which need not be active.
 struct ClearRequest {
     RequestedState& state;
     void const* target;
@@ -83,18 +84,18 @@ public:
     // False makes the creation fail as if memory had run out.
     virtual bool MayCreate(ObjectKind kind) = 0;
     virtual void OnRequest(RendererRequest const& request) = 0;
-    // A handle of program sets a value of the type.
+    // A parameter binding of the program was set.
     virtual void OnValue(void const* program, char const* name, BindingType type, void const* value) = 0;
-    // The vertices are count times floatsPerVertex floats, null when there are none.
+    // data points to count times floatsPerVertex floats, or is null.
     virtual void OnVertices(void const* graphics, int stream, void const* data, int count) = 0;
-    // Behind the request of the draw or the clear.
+    // Called after OnRequest for the same draw or clear.
     virtual void OnDraw(DrawRequest const& draw) = 0;
     virtual void OnClear(ClearRequest const& clear) = 0;
 };
 
 extern RecorderObserver* theObserver;
 
-// Requests that every draw makes test theObserver themselves, which saves the call.
+// Functions that every draw calls test theObserver themselves, to save this call.
 template <class... Values>
 void Observe(ObjectKind kind, void const* object, char const* operation, Values const&... values) {
     if (theObserver) theObserver->OnRequest({kind, object, operation, {RequestValue(values)...}});

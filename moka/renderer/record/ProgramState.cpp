@@ -19,7 +19,7 @@ ProgramState::ProgramState(std::shared_ptr<Recorder> const& recorder, char const
 bool ProgramState::BuildIn(std::shared_ptr<Recorder> const& recorder) {
     if (mIsReleased) return false;
     if (mRecorder == recorder) return mName != 0;
-    // Its former context is gone, and the device's program with it.
+    // The former context and its device program no longer exist.
     Device& device = recorder->GetDevice();
     ProgramLayout layout;
     DeviceName const name =
@@ -42,7 +42,7 @@ bool ProgramState::BuildIn(std::shared_ptr<Recorder> const& recorder) {
     return mName != 0;
 }
 
-// The values set so far, to where the layout has them.
+// Copies the values set so far to their places in the new layout.
 void ProgramState::CopyValues(ProgramLayout const& layout, std::vector<unsigned char>& values) const {
     for (ProgramLayout::Uniform const& old : mLayout.uniforms) {
         ProgramLayout::Uniform const* const now = Find(layout, old.name);

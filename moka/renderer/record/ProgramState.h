@@ -1,9 +1,9 @@
-// ProgramState: the sources of a program, what the device made of them, and the values of its uniforms; shared
-// by the program object and the handles on its parameters.
-// A program belongs to the context that it was built in. Used in another one, it is built there anew; its
-// handles keep working and its values are kept.
-// Owner:   shared; releasing the program object deletes the device's program, and what is left is inert.
-// Thread:  render thread; releasing is tolerated elsewhere.
+// ProgramState: a program's sources, its device program, and the values of its uniforms. The program object
+// and its parameter bindings share it.
+// A program belongs to the context that it was built in. If it is used in another context, it is built again
+// there; its bindings stay valid and its values are kept.
+// Owner:   shared. Releasing the program object deletes the device program; the bindings then do nothing.
+// Thread:  render thread. Release() may run on any thread.
 #pragma once
 
 #include "moka/renderer/device/ProgramLayout.h"
@@ -18,24 +18,26 @@ class Recorder;
 
 class ProgramState {
 public:
-    // Builds nothing without a recorder. Texts are copied.
+    // Builds the program if recorder is not null. Copies the texts.
     ProgramState(std::shared_ptr<Recorder> const& recorder, char const* vertexSource,
                  char const* fragmentSource, char const* label);
 
-    // Within a request: belongs to recorder from now on. False: released, or the driver made no program.
+    // Call this within a request. Builds the program in recorder's context, to which it belongs from then on.
+    // Returns false if the program was released or the driver could not create it.
     bool BuildIn(std::shared_ptr<Recorder> const& recorder);
-    // Of the context that it was built in; null before.
+    // The recorder of the context that the program was built in; null before the first build.
     Recorder* GetRecorder() const { return mRecorder.get(); }
-    // Deletes the device's program; nothing builds it again.
+    // Deletes the device program. BuildIn() fails from then on.
     void Release();
 
-    // The number of a handle on the parameter; the same name always has the same.
+    // Returns the index of the handle for the parameter. Equal names have equal indices.
     std::size_t AddHandle(char const* name);
     BindingType GetType(std::size_t handle) const;
     char const* GetHandleName(std::size_t handle) const { return mHandles[handle].name.c_str(); }
-    // Whether the program's values changed.
+    // Returns true if the value changed.
     bool Set(std::size_t handle, void const* value);
-    // The same for a handle of that type; one that has another type now is left alone.
+    // Like Set(), for a handle of type kType. If the handle has another type now, it does nothing and returns
+    // false.
     template <BindingType kType>
     bool SetAs(std::size_t handle, void const* value) {
         Handle const& place = mHandles[handle];
@@ -53,14 +55,14 @@ public:
     // The texture unit that the sampler is set to.
     int GetSamplerUnit(std::size_t sampler) const;
 
-    // All values, as ProgramLayout places them.
+    // All values at the offsets of ProgramLayout.
     std::vector<unsigned char> const& GetValues() const { return mValues; }
 
-    // What the draw list has of this program.
+    // The latest copy of the values in a draw list.
     struct Listed {
-        std::uint64_t list = 0;
-        std::size_t offset = 0; // of the values copied last
-        bool isStale = false;   // a value was set since
+        std::uint64_t list = 0; // the number of the list
+        std::size_t offset = 0;
+        bool isStale = false; // a value has changed since the copy
     };
     Listed listed;
 
@@ -68,7 +70,7 @@ private:
     struct Handle {
         std::string name;
         BindingType type;   // BindingTypeUnknown: the program has no such uniform
-        std::size_t offset; // of its value
+        std::size_t offset; // of its value in mValues, in bytes
     };
 
     static Handle Resolve(std::string const& name, ProgramLayout const& layout);
@@ -83,7 +85,7 @@ private:
     DeviceName mName = 0;
     bool mIsReleased = false;
     ProgramLayout mLayout;
-    std::vector<unsigned char> mValues; // linking sets every uniform to zero
+    std::vector<unsigned char> mValues; // initially zero, as GL sets uniforms when it links
     std::vector<Handle> mHandles;
 };
 

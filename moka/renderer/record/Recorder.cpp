@@ -34,7 +34,8 @@ void Recorder::Detach() {
     fill.Clear(*this);
     depthStencilPool.Clear();
     {
-        // A name that another thread drops from here on is not ours to delete any more.
+        // Names that another thread drops after this are not deleted: the GL context deletes them with
+        // itself.
         std::lock_guard const lock(mDroppedLock);
         mAttached = false;
         for (Dropped const& dropped : mDropped) Delete(dropped);
@@ -69,7 +70,7 @@ bool Recorder::Draw(GraphicsObject& object, int format, PrimitiveType primitive,
     if (!program || !program->CanDraw()) return false;
     if (count <= 0) return true;
     ++counters.drawRequests;
-    // A draw into the host's frame buffer uses the host's viewport, which the next activation takes away.
+    // A draw into the host's frame buffer uses the host's viewport, which the next activation changes.
     bool const isHosts = !mActive;
     if (isHosts) {
         Flush();
@@ -83,7 +84,7 @@ bool Recorder::Draw(GraphicsObject& object, int format, PrimitiveType primitive,
     if (mStencils.IsPending() && TakeForStencil(state, object, first, count)) return true;
     BeforeDraw(state, object.GetBounds());
     mipmaps.Forget(state.target.texture);
-    // Only now: a flush on the way here takes vertices out of the list.
+    // PlaceVertices() must come last: a flush in the calls above would remove the vertices from the list.
     list.AddDraw(state, !requested->IsChanged(), *program,
                  {object.PlaceVertices(), first, count, object.GetBounds()});
     requested->SetChanged(false);
@@ -107,7 +108,8 @@ TargetRef Recorder::GetCurrentTarget() {
     return hosts;
 }
 
-// Sampling the texture that is drawn into is undefined: drivers show the old texels, the new ones, or neither.
+// In GL, sampling the texture that is drawn into is undefined: drivers return old texels, new ones, or
+// neither.
 void Recorder::SampleCopyOfTarget(RunState& state) {
     for (TextureRef& texture : state.textures) {
         if (texture.texture != state.target.texture) continue;
@@ -170,7 +172,7 @@ void Recorder::RemoveHolder(GraphicsObject const& object) {
 }
 
 void Recorder::Activate(RenderTarget& target) {
-    // What was drawn into another target is complete before external code sees this one bound.
+    // External code may read the other target once this one is bound, so the draws into it are flushed first.
     if (!mIsDeferred && mActive != &target) Flush();
     mActive = &target;
     if (mFlushesAtOnce) End();
@@ -190,7 +192,7 @@ void Recorder::CompleteStencils() {
     if (mActive) mStencils.Complete(mActive->GetRef());
 }
 
-// External GL draws into it.
+// External GL may draw into the active target.
 void Recorder::ForgetMipmapsOfTarget() {
     if (mActive) mipmaps.Forget(mActive->GetRef().texture);
 }
@@ -275,7 +277,7 @@ void Recorder::DropProgram(ProgramState const& program, DeviceName name) {
     Drop(DroppedKind::Program, name);
 }
 
-// Without memory the clip is lost, as a draw would be.
+// If memory runs out, the clip is lost, as a draw would be.
 void Recorder::TryToCompleteStencils() noexcept {
     try {
         CompleteStencils();

@@ -1,12 +1,13 @@
-// Recorder: one attached context: the requested state, the draw list, when the list is flushed, and the names
-// that wait for their deletion.
-// Owner:   the factory from attach to detach, and every object made in it until that object goes, so that a
-//          late release finds a recorder that knows that its context is gone.
+// Recorder: one attached context. It holds the requested state, the draw list and the names that wait for
+// their deletion, and decides when the list is flushed.
+// Owner:   the factory from attach to detach, and every object created in the context until that object is
+//          deleted. So a late release finds a recorder that knows that its context is gone.
 // Thread:  the render thread, except where a line says otherwise.
 //
-// Deferred, requests reach the device at a flush; in between nothing of ours is bound and nothing of the host's
-// is known to change. Immediate, every request but a draw flushes, a deactivation returns the frame buffer to
-// the host, and outside of an active target the host may have called GL since the last request.
+// In deferred mode, requests reach the device at a flush. Between flushes none of our targets is bound, and
+// the host must not change GL state unannounced. In immediate mode, every request except a draw flushes, and
+// a deactivation binds the host's frame buffer again. While no target is active, the host may call GL between
+// two requests.
 #pragma once
 
 #include "moka/base/Check.h"
@@ -31,64 +32,66 @@ class GraphicsObject;
 class RenderTarget;
 class TextureStorage;
 
-// Objects that any thread may drop.
+// The kinds of GL objects whose last owner may be on any thread.
 enum class DroppedKind { Texture, FrameBuffer, Program };
 
 class Recorder : public std::enable_shared_from_this<Recorder> {
 public:
-    // On the render thread, which is the calling one. Null, with one error line, without a usable context.
+    // The calling thread becomes the render thread. Without a usable context, logs an error and returns null.
     static std::shared_ptr<Recorder> Create(RendererLimits const& limits, RendererProcLoader loader);
     Recorder() = default;
     ~Recorder();
     Recorder(Recorder const&) = delete;
     Recorder& operator=(Recorder const&) = delete;
 
-    // Flushes, then deletes pooled and dropped names and the device. Names that are dropped later go down with
-    // the GL context.
+    // Flushes, then deletes pooled and dropped names and the device. Names that are dropped later are left to
+    // the destruction of the GL context.
     void Detach();
 
-    // Any thread.
+    // Callable on any thread.
     bool IsAttached() const { return mAttached; }
     bool IsRenderThread() const { return std::this_thread::get_id() == mRenderThread; }
 
-    // At the beginning of each request. False: the context is detached.
+    // Call this at the beginning of each request. Returns false if the context is detached.
     bool Begin() {
         if (!mAttached) return false;
         MOKA_CHECK(IsRenderThread(), "the renderer is used on the thread that attached it");
-        // Between the library's own draws nothing can have happened.
+        // In deferred mode GL cannot have changed since the last request, so there is nothing to prepare.
         if (mFlushesAtOnce || mHasDropped) Prepare();
         return true;
     }
-    // At the end of a request that may have bound something: the target is bound that the caller expects.
+    // Call this at the end of a request that may have bound a frame buffer. Binds the one that the caller
+    // expects.
     void End();
 
-    // Between Begin and End.
+    // The following functions may be called between Begin and End only.
     Device& GetDevice() { return *mDevice; }
-    // Draws count of the object's vertices, from the first one on, with the requested state. False when nothing
-    // can be drawn. Throws bad_alloc.
+    // Draws count vertices of the object, starting with vertex first, with the requested state. Returns false
+    // if nothing can be drawn. Throws bad_alloc.
     bool Draw(GraphicsObject& object, int format, PrimitiveType primitive, int first, int count);
-    // Adds anything but a draw to the list, which is then flushed if it has to be.
+    // Adds a command other than a draw to the list. Flushes in immediate mode or if the list is full.
     template <class Other>
     void Add(Other const& command) {
         list.Add(command);
         if (mFlushesAtOnce || list.IsFull()) Flush();
     }
     void AddStencilClear(DepthStencilClear const& clear);
-    // Around draws that the list gets in another way: clears that are drawn.
+    // Call these around draws that are added to the list directly, as Fill does.
     void BeforeDraw(RunState const& state, DrawBounds const& bounds) {
         if (state.depthStencil.IsStencil()) mStencils.BeforeDraw(state, bounds);
     }
     void AfterDraw();
-    // Before the texture is sampled. True: its levels are made first, by a command of the list.
+    // Call this before a draw samples the texture. Returns true if it added a command that generates the
+    // mipmap levels.
     bool UpdateMipmaps(TextureRef const& texture);
     bool FlushesAtOnce() const { return mFlushesAtOnce; }
-    // The contents of the buffer are lost.
+    // Call this when the contents of the buffer are lost.
     void ForgetStencil(DeviceName depthStencil) { mStencils.Forget(depthStencil); }
     void Flush();
-    // Before a texture is changed or read at once.
+    // Call this before an upload to the texture or a read-back from it. Flushes if the list uses the texture.
     void FlushIfUsed(DeviceName texture);
-    // Immediate, a request that changed a state lets commit(StateCommit&) add it to what GL gets at once, unless
-    // draws before it wait in the list.
+    // A request that changed a state calls this. In immediate mode with an empty list it calls
+    // commit(StateCommit&), which adds the state, and passes the result to GL at once.
     template <class Commit>
     void CommitAtOnce(Commit commit) {
         if (IsThrough()) CommitNow(commit);
@@ -98,23 +101,25 @@ public:
     void Activate(RenderTarget& target);
     void Deactivate(RenderTarget const& target);
     RenderTarget* GetActive() const { return mActive; }
-    // The active target, or the frame buffer of the host's with a viewport of its own.
+    // The active target, or the host's frame buffer with the host's viewport.
     TargetRef GetCurrentTarget();
 
-    // The object's vertices are copied from the list before it is cleared.
+    // Registers an object that has vertices in the list. They are copied before the list is cleared.
     void AddHolder(GraphicsObject& object) { mHolders.push_back(&object); }
     void RemoveHolder(GraphicsObject const& object);
 
-    // Around external GL. Each is a request of its own.
+    // Call these around external GL. Each begins a request itself.
     void FlushForHost();
     void CommitForExternal();
     void InvalidateState();
     void SetDeferred(bool on);
 
-    // Any thread: deletes the name now, or once the list no longer uses it and the render thread runs.
+    // Callable on any thread. Deletes the name at once if that is safe; otherwise the render thread deletes
+    // it when the list no longer uses it.
     void Drop(DroppedKind kind, DeviceName name);
     void DropProgram(ProgramState const& program, DeviceName name);
-    // Any thread: the last texture object takes the sampling states with it.
+    // Callable on any thread. When the last texture object is deleted, the cached samplers are deleted as
+    // well.
     void DropTextureObject();
 
     Counters counters;
@@ -122,7 +127,7 @@ public:
     DepthStencilPool depthStencilPool{*this};
     Fill fill;
     Mipmaps mipmaps;
-    // Present while attached.
+    // Has a value while the context is attached.
     std::optional<RequestedState> requested;
 
 private:
@@ -138,7 +143,7 @@ private:
         mDevice->Commit(state);
     }
     void SetFlushesAtOnce() { mFlushesAtOnce = mIsExternal || !mIsDeferred; }
-    // Nothing that waits refers to a name.
+    // True if no recorded or pending command refers to a name.
     bool IsIdle() const { return list.IsEmpty() && !mStencils.IsPending(); }
     bool MayDeleteNow() const { return mAttached && IsRenderThread() && IsIdle(); }
     void Prepare();
@@ -148,7 +153,8 @@ private:
     void SampleCopyOfTarget(RunState& state);
     void ForgetMipmapsOfTarget();
     void CommitStates();
-    // Before the stencil of the active target is left to others, or what draws it goes. Throws bad_alloc.
+    // Call this before external GL may see the stencil of the active target, or before a program that draws
+    // it is deleted. Throws bad_alloc.
     void CompleteStencils();
     void TryToCompleteStencils() noexcept;
 
@@ -156,11 +162,11 @@ private:
     std::thread::id const mRenderThread = std::this_thread::get_id();
     RenderTarget* mActive = nullptr;
     bool mIsDeferred = false;
-    bool mIsExternal = false;   // between a commit and the invalidation, while GL belongs to external code
-    bool mFlushesAtOnce = true; // immediate or external
+    bool mIsExternal = false;   // from a commit to the invalidation: external code may call GL
+    bool mFlushesAtOnce = true; // immediate mode, or mIsExternal
     std::vector<GraphicsObject*> mHolders;
     StencilPreparations mStencils{list};
-    // A draw that samples its own target samples this copy; kept while the same size is needed.
+    // A draw that samples its own target samples this copy instead. It is kept while its size fits.
     std::shared_ptr<TextureStorage> mTargetCopy;
 
     std::atomic<bool> mAttached{true};
@@ -169,13 +175,13 @@ private:
     std::vector<Dropped> mDropped;
 };
 
-// The recorder attached now or, for the statistics, the last one. Any thread.
+// The attached recorder or, for the statistics, the last one. Callable on any thread.
 std::shared_ptr<Recorder> GetRecorder();
-// For the render thread, where it cannot go meanwhile: the one that is attached, or null.
+// The attached recorder, or null. Render thread only: there it cannot be detached while it is used.
 Recorder* GetAttachedRecorder();
 void SetRecorder(std::shared_ptr<Recorder> recorder);
 
-// A request that may change what is bound: Begin and End.
+// Calls Begin and End around a request that may change the bound frame buffer.
 class RequestScope {
 public:
     explicit RequestScope(Recorder& recorder) : mRecorder(recorder), mLive(recorder.Begin()) {}
@@ -185,7 +191,7 @@ public:
     RequestScope(RequestScope const&) = delete;
     RequestScope& operator=(RequestScope const&) = delete;
 
-    // False when the context is gone: the object is inert.
+    // False if the context is detached; the request must then do nothing.
     explicit operator bool() const { return mLive; }
 
 private:

@@ -51,7 +51,7 @@ void RenderTarget::ReadPixels(int x, int y, int width, int height, PixelDestinat
     if (rowLength < width || destination.skipRows < 0 || destination.skipPixels < 0) {
         __android_log_print(ANDROID_LOG_ERROR, "mok_log",
                             "reading %d pixels a row into rows of %d, %d rows down and %d pixels in, is "
-                            "refused; rows must not overlap and nothing can be skipped backwards",
+                            "refused; rows must not overlap and skips must not be negative",
                             width, rowLength, destination.skipRows, destination.skipPixels);
         return;
     }
@@ -67,7 +67,7 @@ void RenderTarget::ReadPixels(int x, int y, int width, int height, PixelDestinat
 
 void RenderTarget::Release() {
     Observe(kTargetKind, this, "Release");
-    // Outlives this object.
+    // Keeps the recorder alive after `delete this`.
     std::shared_ptr<Recorder> const recorder = mRecorder;
     RequestScope const scope(*recorder);
     ForgetDepthStencil();
@@ -91,7 +91,7 @@ void RenderTarget::ClearColor(float r, float g, float b, float a) {
     }
 }
 
-// A host's frame buffer may or may not have one; drawing is right either way.
+// A frame buffer of the host may have a stencil buffer or not. Fill draws correctly in both cases.
 bool RenderTarget::HasStencil() const { return mDepthStencil || IsHosts(); }
 
 void RenderTarget::AttachDepthStencil(IDepthStencilBuffer* buffer) {
@@ -115,7 +115,7 @@ bool RenderTarget::MayAttach(DepthStencilBuffer const& buffer) const {
     __android_log_print(ANDROID_LOG_ERROR, "mok_log",
                         "a depth-stencil buffer of %d x %d cannot be attached to a %s of %d x %d%s",
                         buffer.GetWidth(), buffer.GetHeight(),
-                        IsHosts() ? "frame buffer of the host's" : "render target", mRef.width, mRef.height,
+                        IsHosts() ? "frame buffer of the host" : "render target", mRef.width, mRef.height,
                         sameContext ? "" : " of another context");
     return false;
 }

@@ -1,4 +1,4 @@
-// RenderTarget: a render target over a texture or over a frame buffer of the host's.
+// RenderTarget: a render target that draws into a texture or into a frame buffer of the host.
 #pragma once
 
 #include "moka/renderer/IRenderTarget.h"
@@ -30,12 +30,12 @@ public:
     void DetachDepthStencil() override;
     void ClearDepthStencil(bool clearDepth, float depth, bool clearStencil, int stencil) override;
 
-    // As commands name it, with the depth-stencil buffer attached now.
+    // The reference for commands. It names the depth-stencil buffer that is attached now.
     TargetRef const& GetRef() const { return mRef; }
     std::shared_ptr<FrameBuffer> const& GetFrameBuffer() const { return mFrameBuffer; }
-    // The buffer that is attached, or null.
+    // The attached buffer, or null.
     DepthStencilBuffer const* GetDepthStencil() const { return mDepthStencil; }
-    // No depth-stencil buffer afterwards. Commands in the list name the one they were made with.
+    // Detaches the buffer for later commands. Recorded commands still use it.
     void ForgetDepthStencil();
 
 private:

@@ -1,4 +1,5 @@
-// RendererFactory: validates what is asked of it, once for every device, and makes the recorder's objects.
+// RendererFactory: validates all arguments, the same way for every device, and creates the recorder's
+// objects.
 #include "moka/renderer/RendererFactory.h"
 
 #include "moka/base/log/AndroidLog.h"
@@ -33,7 +34,7 @@ void LogRefusal(char const* function, char const* reason) {
     __android_log_print(ANDROID_LOG_ERROR, "mok_log", "RendererFactory::%s: %s", function, reason);
 }
 
-// The recorder of the attached context, or null with an error line.
+// Returns the recorder of the attached context. Without one, logs an error and returns null.
 std::shared_ptr<Recorder> GetAttached(char const* function) {
     std::shared_ptr<Recorder> recorder = GetRecorder();
     if (recorder && recorder->IsAttached()) return recorder;
@@ -41,8 +42,8 @@ std::shared_ptr<Recorder> GetAttached(char const* function) {
     return nullptr;
 }
 
-// What create(recorder) makes within a request; null without a context, when the observer refuses, or when
-// memory runs out.
+// Calls create(recorder) within a request and returns its object. Returns null if no context is attached, the
+// observer refuses, or memory runs out.
 template <class Create>
 auto CreateIn(char const* function, ObjectKind kind, Create create) -> decltype(create(nullptr)) {
     std::shared_ptr<Recorder> const recorder = GetAttached(function);
@@ -69,7 +70,7 @@ bool IsSizeOk(char const* function, int width, int height) {
     return false;
 }
 
-// The codes of RGBA8, two-dimensional.
+// True for two-dimensional RGBA8, the only format.
 bool IsKnownFormat(TextureDescriptor const& descriptor) {
     return descriptor.dimension == 0 && descriptor.format == 2 && descriptor.internalFormat == 6 &&
            descriptor.type == 1;
@@ -95,7 +96,7 @@ bool IsDescriptorOk(TextureDescriptor const& descriptor, PixelSource const& sour
     return true;
 }
 
-// The model's storage, or a new one.
+// Returns the storage of the texture that the descriptor shares, or a new one.
 std::shared_ptr<TextureStorage> ChooseStorage(std::shared_ptr<Recorder> const& recorder,
                                               TextureDescriptor const& descriptor,
                                               PixelSource const& source) {

@@ -36,7 +36,7 @@ ScissorRect const& RequestedState::GetScissorRect() {
     return mDraw.scissor.rect;
 }
 
-// While the test is off, the rectangle is not queried.
+// Does not query the rectangle while the scissor test is off.
 ScissorState const& RequestedState::GetScissor() {
     if (IsScissorEnabled()) GetScissorRect();
     return mDraw.scissor;
@@ -96,7 +96,7 @@ TextureRef RequestedState::GetTexture(int unit) const {
     return texture;
 }
 
-// A unit that the program names and that has nothing bound samples what GL has there.
+// If a sampler's unit has no texture of ours, the draw samples the texture that GL has bound there.
 void RequestedState::ResolveTextures() {
     std::size_t const count = mProgram->GetSamplerCount();
     for (std::size_t i = 0; i < kMaxSamplers; ++i) {

@@ -1,8 +1,9 @@
-// RequestedState: the state requested for the next draw. The device tracks what GL has; submitting and
-// committing apply this one.
+// RequestedState: the state requested for the next draw. The device tracks the actual GL state; submitting
+// and committing apply this one.
 // Thread: render thread.
-// A part that was not set since external GL may have run is unknown: for the scissor the device is queried,
-// blending and the depth-stencil tests count as off, and a commit leaves unknown parts alone.
+// After external GL may have run, a state is unknown until it is set again. An unknown scissor is queried
+// from the device, unknown blending and depth-stencil tests count as off, and a commit does not set unknown
+// states.
 #pragma once
 
 #include "moka/renderer/device/RunState.h"
@@ -29,7 +30,7 @@ public:
     ScissorState const& GetScissor();
 
     void SetBlend(BlendStateDescriptor const& blend);
-    // Ignored without a stencil test while a stencil clip is on.
+    // While a stencil clip is on, a state without a stencil test is ignored.
     void SetDepthStencil(DepthStencilStateDescriptor const& depthStencil);
     void SetStencilClip(bool on) { mStencilClip = on; }
     BlendStateDescriptor const& GetBlend() const { return mDraw.blend; }
@@ -42,18 +43,19 @@ public:
     int GetUnitCount() const { return static_cast<int>(mUnits.size()); }
     void SetTexture(int unit, std::shared_ptr<TextureStorage> const& storage, Sampling const& sampling);
 
-    // The state of a draw onto target, with the textures that the program samples. Valid until the next call.
+    // Returns the state of a draw into target, with the textures that the program samples. The reference is
+    // valid until the next call.
     RunState& Resolve(TargetRef const& target, int format, PrimitiveType primitive);
-    // Whether the state differs from the last draw's.
+    // True if the state differs from that of the last draw.
     bool IsChanged() const { return mChanged; }
     void SetChanged(bool changed) { mChanged = changed; }
 
-    // Adds what is known of scissor, blend and depth-stencil state. Refers to this object.
+    // Adds the known scissor, blend and depth-stencil states. commit then points into this object.
     void AddStatesTo(StateCommit& commit) const;
-    // What is bound to the units, for a commit.
+    // The textures bound to the units, for a commit.
     std::vector<TextureRef> const& GetTextures();
 
-    // External GL may have changed the states.
+    // Makes the states unknown, because external GL may have changed them.
     void Forget();
 
 private:

@@ -1,8 +1,8 @@
-// RunBounds: where the draws of one run lie on their target, so that a later draw can tell whether it touches any
-// of them. A box that is not known touches everything.
+// RunBounds: the bounding boxes of a run's draws on their target, to test whether a later draw overlaps any
+// of them. An unknown box overlaps everything.
 // Units: normalized device coordinates.
-// Cost:  boxes are grouped by eight, so that most of a run is passed over. A run of many draws answers that it
-//        is touched. The memory is kept for the next list.
+// Cost:  boxes are grouped by eight, so that a test skips most of them. A run of more than kMostBoxes draws
+//        counts as overlapped. The memory is reused for the next list.
 #pragma once
 
 #include "moka/renderer/DrawBounds.h"
@@ -12,7 +12,7 @@
 
 namespace Moka::detail {
 
-// Unknown if one of them is.
+// Returns the box that encloses both. It is unknown if one of them is.
 inline DrawBounds Enclose(DrawBounds const& a, DrawBounds const& b) {
     if (!a.IsKnown() || !b.IsKnown()) return {};
     return {std::min(a.left, b.left), std::min(a.bottom, b.bottom), std::max(a.right, b.right),
@@ -22,7 +22,7 @@ inline DrawBounds Enclose(DrawBounds const& a, DrawBounds const& b) {
 class RunBounds {
 public:
     void Clear();
-    // Without memory nothing is known any more.
+    // If memory runs out, the run counts as overlapped from then on.
     void Add(DrawBounds const& box) noexcept;
     bool MayTouch(DrawBounds const& box) const;
 
@@ -33,7 +33,7 @@ private:
     static constexpr std::size_t kMostBoxes = 1024;
 
     DrawBounds mAll;
-    bool mIsKnown = true; // each box is known, and there are not too many
+    bool mIsKnown = true; // all boxes are known, at most kMostBoxes of them
     std::vector<DrawBounds> mBoxes;
     std::vector<DrawBounds> mGroups;
 };

@@ -44,12 +44,12 @@ protected:
     }
 
     std::shared_ptr<ProgramState> const mProgram;
-    void const* const mObject; // names the program to the observer, not used otherwise
+    void const* const mObject; // identifies the program to the observer; never dereferenced
     std::size_t const mHandle;
 
 private:
-    // Values of a program that is not the current one wait until it is. Outside of a target the host may have
-    // made a program of its own current.
+    // Values of a program that is not current reach GL when it becomes current. While no target is active,
+    // the host may have made its own program current.
     void CommitValues(Recorder& recorder) const {
         bool const isCurrent =
             recorder.IsAttached() && recorder.GetActive() && recorder.requested->GetProgram() == mProgram;
@@ -57,7 +57,7 @@ private:
     }
 };
 
-// Most draws set parameters of these types, each several: no switch on the way.
+// A parameter of one of the types that most draws set, so that Set() needs no switch.
 template <BindingType kType>
 class Parameter final : public ParameterBase {
 public:
@@ -68,7 +68,7 @@ public:
     }
 };
 
-// Of any other type, or of one that is not known before the program is built.
+// A parameter of any other type, or of a type that is unknown until the program is built.
 class AnyParameter final : public ParameterBase {
 public:
     using ParameterBase::ParameterBase;
@@ -96,8 +96,8 @@ IParameterBinding* MakeParameter(std::shared_ptr<ProgramState> const& program, v
     }
 }
 
-// A parameter of no program. It has no state, so all of them share one place in memory, and handing one out
-// cannot fail.
+// The parameter that is returned if memory runs out. It has no state, so one static object serves all
+// callers.
 class InertParameter final : public IParameterBinding {
 public:
     static IParameterBinding* Get() {
@@ -139,7 +139,7 @@ void ShaderProgram::MakeCurrent() {
         try {
             mState->BuildIn(recorder->shared_from_this());
         } catch (std::bad_alloc const&) {
-            // It draws nothing.
+            // Draws with this program then do nothing.
         }
     }
     recorder->requested->SetProgram(mState);

@@ -1,4 +1,4 @@
-// ShaderProgram: a program as the factory hands it out; ProgramState has its texts and values.
+// ShaderProgram: the factory's implementation of IShaderProgram. ProgramState holds the sources and values.
 #pragma once
 
 #include "moka/renderer/IShaderProgram.h"
@@ -13,7 +13,7 @@ class ShaderProgram final : public IShaderProgram {
 public:
     explicit ShaderProgram(std::shared_ptr<ProgramState> state);
 
-    // What the factory gives when memory has run out: it draws nothing and is never deleted.
+    // The program that the factory returns when memory has run out. It draws nothing and is never deleted.
     static IShaderProgram* GetInert();
 
     void MakeCurrent() override;

@@ -18,12 +18,12 @@ void ApplyTo(Recorder& recorder, BlendStateDescriptor const& descriptor) {
 
 void ApplyTo(Recorder& recorder, DepthStencilStateDescriptor const& descriptor) {
     recorder.requested->SetDepthStencil(descriptor);
-    // A stencil clip keeps its own.
+    // Not mDescriptor: while a stencil clip is on, the requested state may differ.
     recorder.CommitAtOnce(
         [&](StateCommit& commit) { commit.depthStencil = &recorder.requested->GetDepthStencil(); });
 }
 
-// The attached recorder, with a request begun; null without one.
+// Begins a request and returns the attached recorder. Returns null if no context is attached.
 Recorder* BeginRequest() {
     Recorder* const recorder = GetAttachedRecorder();
     return recorder && recorder->Begin() ? recorder : nullptr;

@@ -1,5 +1,5 @@
-// StateObjects.h: blend state, depth-stencil state and scissor as the factory hands them out: each writes its
-// part of the requested state.
+// StateObjects.h: the factory's blend state, depth-stencil state and rasterizer state (scissor). Each sets
+// its member of RequestedState.
 #pragma once
 
 #include "moka/renderer/IBlendStateObject.h"
@@ -35,7 +35,7 @@ using DepthStencilState = StateObject<IDepthStencilState, DepthStencilStateDescr
 extern template class StateObject<IBlendStateObject, BlendStateDescriptor>;
 extern template class StateObject<IDepthStencilState, DepthStencilStateDescriptor>;
 
-// The scissor of whatever context is attached. Without one it keeps nothing.
+// Sets the scissor of the attached context. Without a context, calls do nothing.
 class RasterizerState final : public IRasterizerState {
 public:
     bool IsScissorEnabled() override;

@@ -14,7 +14,7 @@ bool WritesStencil(RunState const& state) {
     return state.depthStencil.IsStencil() && state.depthStencil.GetWriteMask() != 0;
 }
 
-// The pixels from low to high, in normalized device coordinates, and one more on either side.
+// Converts low and high from normalized device coordinates to pixels, and adds one pixel on either side.
 void ToPixels(float low, float high, int size, int* first, int* count) {
     float const scale = static_cast<float>(size) * 0.5f;
     auto const clamp = [=](float pixel) {
@@ -71,7 +71,7 @@ bool StencilPreparations::TakeClear(DepthStencilClear const& clear) {
         Forget(buffer);
         return false;
     }
-    // A preparation of the same buffer that nobody used is lost.
+    // A preparation of the same buffer that no draw has used is dropped.
     if (!IsPendingFor(buffer)) Finish();
     mPending.Clear();
     mPending.target = clear.target;
@@ -147,7 +147,7 @@ StencilPreparations::Content* StencilPreparations::Find(DeviceName buffer) {
     return found == mContents.end() ? nullptr : &*found;
 }
 
-// The content of the buffer is not known yet.
+// Returns the entry of the buffer, with unknown content.
 StencilPreparations::Content& StencilPreparations::Replace(DeviceName buffer) {
     Content* content = Find(buffer);
     if (!content && mContents.size() == kMostContents) {
@@ -163,7 +163,7 @@ StencilPreparations::Content& StencilPreparations::Replace(DeviceName buffer) {
     return *content;
 }
 
-// Of a preparation in the present list the part grows; one that was flushed is drawn anew.
+// Extends a preparation in the current list to cover part, or records one again that was flushed.
 void StencilPreparations::Ensure(Content& content, TargetRef const& target, ScissorRect const& part) {
     if (content.list != 0 && IsInside(part, content.part)) return;
     if (content.list != mList.GetNumber()) {

@@ -1,9 +1,9 @@
-// StencilPreparations: what draws into the stencil alone leave in a depth-stencil buffer. A preparation is a clear
-// of the stencil and the draws that follow it without writing colour. It is recorded when a draw that tests the
-// stencil needs it, where that draw lies, and not again while the buffer still holds it.
+// StencilPreparations: avoids drawing the same stencil clip twice. A preparation is a clear of the stencil
+// and the draws after it that do not write colour. It is kept back until a draw tests the stencil, then
+// recorded for the area of that draw, and not recorded again while the buffer still holds the result.
 // Owner:  the recorder.
-// Thread: render thread, within a request. Used while requests are deferred.
-// Cost:   two preparations are compared by their values and vertices. The memory for them is kept.
+// Thread: render thread, within a request. Used in deferred mode only.
+// Cost:   preparations are compared by their values and vertices. Their memory is reused.
 #pragma once
 
 #include "moka/renderer/DrawBounds.h"
@@ -20,24 +20,26 @@ class StencilPreparations {
 public:
     explicit StencilPreparations(DrawListBuilder& list) : mList(list) {}
 
-    // The next request of a preparation is kept. False: it is none, and the caller records it.
+    // Keep back one request of a preparation. They return false if the request does not belong to a
+    // preparation; the caller then records it.
     bool TakeClear(DepthStencilClear const& clear);
     bool TakeDraw(RunState const& state, ProgramState const& program, float const* vertices, int count,
                   int stride);
 
     bool IsPending() const { return mIsPending; }
-    // Before a draw that tests the stencil is recorded: the buffer holds what the draw tests. Throws bad_alloc.
+    // Call this before a draw that tests the stencil. Records the preparation that the draw needs. Throws
+    // bad_alloc.
     void BeforeDraw(RunState const& state, DrawBounds const& bounds);
-    // What is kept is recorded.
+    // Ends the pending preparation.
     void Finish();
-    // Before the target's buffer is written in another way, or external GL may see it: what is kept is recorded,
-    // and drawn all over the target.
+    // Call this before other commands write the target's buffer or external GL may see it. Records the
+    // pending preparation and extends it to the whole target.
     void Complete(TargetRef const& target);
-    // Whether one that is kept or that a buffer holds is drawn with the program.
+    // True if a pending preparation, or one that a buffer holds, draws with the program.
     bool Uses(DeviceName program) const;
-    // The buffer's contents are not known any more.
+    // Call this when the contents of the buffer change in an unknown way.
     void Forget(DeviceName depthStencil);
-    // The program is deleted.
+    // Call this when the program is deleted.
     void ForgetUses(DeviceName program);
     void ForgetAll();
 
@@ -45,7 +47,7 @@ private:
     struct Step {
         bool isClear;
         int clearValue;
-        RunState state; // of a draw; its target is the one of the whole
+        RunState state; // of a draw; its target is Recipe::target
         std::size_t values;
         std::size_t valueBytes;
         std::size_t vertices;
@@ -55,7 +57,7 @@ private:
         bool IsSame(Step const& other) const;
     };
 
-    // The steps and what they refer to.
+    // The steps of one preparation, with their values and vertices.
     struct Recipe {
         TargetRef target;
         std::vector<Step> steps;
@@ -67,13 +69,13 @@ private:
         bool Uses(DeviceName program) const;
     };
 
-    // What one buffer holds inside a part of it.
+    // The preparation that one buffer holds, and where.
     struct Content {
         DeviceName buffer = 0;
         Recipe recipe;
-        ScissorRect part;
-        std::uint64_t list = 0;            // that it was recorded in last
-        std::vector<std::size_t> commands; // of that list
+        ScissorRect part;                  // the area that was drawn
+        std::uint64_t list = 0;            // the last list that it was recorded in
+        std::vector<std::size_t> commands; // its commands in that list
     };
 
     static constexpr std::size_t kMostContents = 8;

@@ -23,7 +23,7 @@ bool IsWrap(int value) {
 
 bool IsFilter(int value) { return value >= TextureFilterNearest && value <= TextureFilterMipmapped; }
 
-// False for a parameter or a value that does not exist.
+// Returns false for an unknown parameter or value.
 bool StoreParameter(Sampling& sampling, int id, int value) {
     switch (id) {
     case TextureParamWrappingS:
@@ -39,7 +39,7 @@ bool StoreParameter(Sampling& sampling, int id, int value) {
         auto const filter = static_cast<TextureParamFilteringValue>(value);
         if (id == TextureParamFilteringMin) {
             sampling.minFilter = filter;
-        } else { // levels are for shrinking alone
+        } else { // GL uses mipmap levels for minification only
             sampling.magFilter = filter == TextureFilterMipmapped ? TextureFilterLinear : filter;
         }
         return true;
@@ -157,7 +157,7 @@ void TextureObject::CopyFromRenderTarget() {
     RequestScope const scope(recorder);
     if (!scope || IsActiveTarget()) return;
     TargetRef const from = recorder.GetCurrentTarget();
-    // Only a host's frame buffer may lack alpha; the device then needs a frame buffer to copy into.
+    // Only a frame buffer of the host may lack alpha. The device then copies by way of a frame buffer.
     DeviceName const own = from.texture == 0 ? mStorage->TakeFrameBuffer() : 0;
     int const width = from.width > 0 ? std::min(from.width, GetWidth()) : GetWidth();
     int const height = from.height > 0 ? std::min(from.height, GetHeight()) : GetHeight();

@@ -1,4 +1,4 @@
-// TextureObject: a view of a storage with a sampling state and a label of its own.
+// TextureObject: a texture as the library sees it: shared texels, with its own sampling state and label.
 #pragma once
 
 #include "moka/renderer/ITextureObject.h"
@@ -18,7 +18,7 @@ public:
 
     std::shared_ptr<TextureStorage> const& GetStorage() const { return mStorage; }
     Sampling const& GetSampling() const { return mSampling; }
-    // As SetParameter, for the initial parameters of a creation.
+    // Sets an initial parameter when the texture is created.
     void Store(int id, int value);
 
     void SetLabel(char const* text) override;
@@ -35,7 +35,8 @@ public:
 
 private:
     void Upload(Rect const& rect, void const* pixels, int stride);
-    // A copy of an image onto itself changes nothing, and GL leaves it undefined.
+    // True if the copy's source is the same texture. The copy is then skipped, because GL leaves it
+    // undefined.
     bool IsActiveTarget() const;
 
     std::shared_ptr<TextureStorage> const mStorage;

@@ -34,9 +34,9 @@ TextureStorage::~TextureStorage() {
     mRecorder->Drop(DroppedKind::Texture, mName);
 }
 
-// As a clear of a frame buffer, not as an upload of zeros: no memory to fill and to move, tiled GPUs do it
-// without touching the texels, and the frame buffer is needed soon after, because a texture without pixels is
-// there to be drawn into.
+// Clears by way of a frame buffer, not by an upload of zeros: no memory is filled and transferred, and tiled
+// GPUs clear without touching the texels. A texture without pixels is usually drawn into next, so the frame
+// buffer is needed anyway.
 bool TextureStorage::Clear() {
     DeviceName const frameBuffer = TakeFrameBuffer();
     if (frameBuffer == 0) return false;

@@ -1,7 +1,7 @@
 // TextureStorage: the texels that several texture objects and render targets share. The last owner deletes
-// them, once.
+// them.
 // Owner:  shared.
-// Thread: render thread; the last owner may go on any.
+// Thread: render thread. The last owner may be deleted on any thread.
 // Units:  texels; row 0 is the first row uploaded.
 #pragma once
 
@@ -16,7 +16,8 @@ class Recorder;
 
 class TextureStorage {
 public:
-    // Within a request. Transparent when source has no pixels. Null when the device refuses.
+    // Call this within a request. The texels are transparent if source has no pixels. Returns null if the
+    // device cannot create the texture.
     static std::shared_ptr<TextureStorage> Create(std::shared_ptr<Recorder> const& recorder, int width,
                                                   int height, PixelSource const& source);
     TextureStorage(std::shared_ptr<Recorder> recorder, DeviceName name, int width, int height);
@@ -29,8 +30,9 @@ public:
     int GetWidth() const { return mWidth; }
     int GetHeight() const { return mHeight; }
 
-    // Within a request: a frame buffer over these texels; 0 when the device refuses. The storage keeps one that
-    // is returned, because reading a pixel takes one and returns it.
+    // Call this within a request. Returns a frame buffer with this texture attached, or 0 if the device
+    // cannot create one. A returned frame buffer is kept for the next call, because each read-back takes and
+    // returns one.
     DeviceName TakeFrameBuffer();
     void ReturnFrameBuffer(DeviceName frameBuffer);
     TargetRef Describe(DeviceName frameBuffer) const;

@@ -1,5 +1,5 @@
-// UniformValue.h: writes the value of a uniform over the one that is kept. In line: each draw does it for each
-// uniform, mostly with the value that is there.
+// UniformValue.h: replaces the stored value of a uniform and reports whether it changed. The functions are in
+// line because each draw calls one for each uniform, mostly with an equal value.
 #pragma once
 
 #include "moka/base/SameBits.h"
@@ -19,12 +19,12 @@ inline bool ReplaceWord(unsigned char* kept, void const* value) {
     return before != now;
 }
 
-// Whether the value was another one.
+// Copies value to kept. Returns true if the bytes differed.
 template <BindingType kType>
 bool ReplaceValue(unsigned char* kept, void const* value) {
     constexpr std::size_t kBytes = GetValueSize(kType);
     if constexpr (kType == BindingTypeBool) {
-        // Callers hand over a bool, of which only one byte is there to be read.
+        // value points to a bool, which is 1 byte; the stored value is an integer of 4 bytes.
         std::int32_t const flag = *static_cast<bool const*>(value) ? 1 : 0;
         return ReplaceWord(kept, &flag);
     } else if constexpr (kBytes == sizeof(std::uint32_t)) {

@@ -215,11 +215,14 @@ TEST_F(WindowTest, AWindowThatIsDestroyedWhileFramesWaitIsOneLineAndTheThreadGoe
 TEST_F(WindowTest, WhatIsNotThereIsToldAndEndsNothing) {
     thread.reset();
     RenderThreadOptions missing = options;
-    missing.nativeWindow = options.nativeWindow + 1000;
     for (void* const display : {options.nativeDisplay, static_cast<void*>(nullptr)}) {
         missing.nativeDisplay = display;
-        EXPECT_FALSE(RenderThread::Start(missing, &error));
-        EXPECT_THAT(error, HasSubstr("no window 0x"));
+        for (std::uintptr_t const number :
+             {UINTPTR_MAX, std::uintptr_t{1} << 29, options.nativeWindow + 1000}) {
+            missing.nativeWindow = number;
+            EXPECT_FALSE(RenderThread::Start(missing, &error));
+            EXPECT_THAT(error, HasSubstr("no window 0x"));
+        }
     }
     std::string const name = std::getenv("DISPLAY");
     setenv("DISPLAY", ":7654", 1);

@@ -49,9 +49,9 @@ TEST(NotebookFileTest, TellsWhatItLeavesOutAndKeepsTheRest) {
         std::size_t left;
     };
     for (Case const& c :
-         {Case{"an operation of others", "\"DrawStroke\"", "\"DrawCircle\"", "p.json:8:", 3},
-          Case{"a number that is none", "99999.99", "\"x\"", "p.json:8:", 3},
-          Case{"no JSON", "-3,", "-3,,", "p.json:8:", 3}, Case{"cut off", "]}\n", "", "the file ends", 4},
+         {Case{"an operation of others", "\"DrawStroke\"", "\"DrawCircle\"", "p.json:3:", 3},
+          Case{"a number that is none", "99999.99", "\"x\"", "p.json:3:", 3},
+          Case{"no JSON", "-3.0,", "-3.0,,", "p.json:3:", 3}, Case{"cut off", "]}\n", "", "the file ends", 4},
           Case{"another width", "[1200,", "[1000,", "as wide as a page", 4},
           Case{"another paper", "#FFFFFF", "#FFFFF0", "on white paper", 4}}) {
         std::string text = WritePage(MakeObjects(), 2000, kFolder);

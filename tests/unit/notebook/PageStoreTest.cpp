@@ -102,7 +102,7 @@ TEST_F(NotebookStoreTest, AJournalCutOffAtAnyByteGivesAnEarlierState) {
 }
 
 TEST_F(NotebookStoreTest, AJournalLeftByAnInterruptedSaveIsNotAppliedTwice) {
-    auto const document = Open(mPath);
+    auto document = Open(mPath);
     document->GetPage().Append(MakeDash(1, 1));
     Autosave(*document);
     std::string const journal = ReadFile(mJournal);
@@ -119,6 +119,7 @@ TEST_F(NotebookStoreTest, AJournalLeftByAnInterruptedSaveIsNotAppliedTwice) {
     WriteFile(mJournal, journal);
     WriteFile(mPath, page + "\n");
     mTold.clear();
+    document.reset();
     EXPECT_EQ(Open(mPath)->GetPage().GetObjects().size(), 1u);
     EXPECT_THAT(mTold, HasSubstr("kept as " + mJournal + ".kept"));
     EXPECT_EQ(ReadFile(mJournal + ".kept"), journal);
@@ -134,7 +135,7 @@ TEST_F(NotebookStoreTest, APageThatWasNotReadWholeIsSavedUnderANewNameOnly) {
     broken.replace(broken.rfind("DrawStroke"), 10, "DrawCircle");
     WriteFile(mPath, broken);
     mTold.clear();
-    auto const document = Open(mPath);
+    auto document = Open(mPath);
     EXPECT_THAT(mTold, HasSubstr("save"));
     EXPECT_EQ(document->GetPage().GetObjects().size(), 2u);
     document->GetPage().Append(MakeDash(7, 7));
@@ -145,8 +146,40 @@ TEST_F(NotebookStoreTest, APageThatWasNotReadWholeIsSavedUnderANewNameOnly) {
     EXPECT_EQ(ReadFile(mPath), broken);
     EXPECT_EQ(document->GetPath(), elsewhere);
     EXPECT_FALSE(document->MustRename());
+    document.reset();
     EXPECT_EQ(Open(elsewhere)->GetPage().GetObjects().size(), 3u);
     EXPECT_EQ(Document::GetLastPath(), elsewhere);
+}
+
+// What is drawn and undone for hours does not fill the disk.
+TEST_F(NotebookStoreTest, AJournalIsWrittenAnewBeforeItIsMuchLongerThanThePage) {
+    auto const document = Open(mPath);
+    document->GetPage().Append(MakeDash(1, 1));
+    document->Save(nullptr);
+    document->GetPage().Append(MakeDash(2, 2));
+    for (int i = 0; i < 7; ++i) { // 1 MB each
+        document->GetPage().Append(MakeStroke(InkPoints(40'000, {10'000.25f, 10'000.25f, 10.25f})));
+        document->GetPage().Undo();
+        Autosave(*document);
+    }
+    EXPECT_LT(std::filesystem::file_size(mJournal), 3'000'000u);
+    EXPECT_TRUE(AreSame(OpenCopy(), document->GetPage().GetObjects()));
+}
+
+TEST_F(NotebookStoreTest, ASecondWindowOnAPageIsRefusedUntilTheFirstLeavesIt) {
+    auto first = Open(mPath);
+    first->GetPage().Append(MakeDash(1, 1));
+    auto const second = Open(mFolder.Path("other.json"));
+    second->GetPage().Append(MakeDash(2, 2));
+    EXPECT_FALSE(second->Open(mPath));
+    EXPECT_THAT(mTold, HasSubstr("p.json is open in another window"));
+    EXPECT_FALSE(second->Save(&mPath));
+    EXPECT_EQ(second->GetPath(), mFolder.Path("other.json"));
+    EXPECT_TRUE(first->Close());
+    first.reset();
+    EXPECT_TRUE(second->Open(mPath));
+    EXPECT_TRUE(AreSame(second->GetPage().GetObjects(), {MakeDash(1, 1)}));
+    EXPECT_EQ(Open(mFolder.Path("other.json"))->GetPage().GetObjects().size(), 1u) << "its own was saved";
 }
 
 // A folder in the place of the file: fails for every user, root among them.
@@ -156,10 +189,13 @@ TEST_F(NotebookStoreTest, AFailedSaveSaysSoAndLosesNothing) {
     std::filesystem::create_directories(mJournal + "/x");
     Autosave(*document);
     EXPECT_THAT(mTold, HasSubstr("cannot autosave to " + mJournal));
-    std::string const to = mFolder.Path("none/such/folder.json");
-    document->Save(&to);
-    EXPECT_FALSE(document->Close());
-    EXPECT_THAT(mTold, HasSubstr("cannot save " + to));
+    WriteFile(mFolder.Path("file"), "");
+    for (char const* const name : {"none/such/folder.json", "file/in-no-folder.json"}) {
+        std::string const to = mFolder.Path(name);
+        document->Save(&to);
+        EXPECT_FALSE(document->Close());
+        EXPECT_THAT(mTold, HasSubstr("cannot save " + to));
+    }
     EXPECT_TRUE(document->HasUnsaved());
     EXPECT_EQ(document->GetPath(), mPath);
     std::filesystem::remove_all(mJournal);

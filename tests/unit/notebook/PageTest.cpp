@@ -34,7 +34,7 @@ TEST(NotebookPageTest, UndoAndRedoWalkThroughEveryStateInOrder) {
     EXPECT_FALSE(page.CanRedo()) << "a new edit ends what could be done again";
 }
 
-TEST(NotebookPageTest, FindsByBoundsFromTheLowestUpAfterEveryEdit) {
+TEST(NotebookPageTest, FindsByBoundsFromTheLowestUpAndIsAsLongAsItIsWritten) {
     Page page;
     for (float const y : {100.0f, 200.0f, 110.0f}) page.Append(MakeDash(50, y));
     EXPECT_EQ(page.Find({60, 90, 70, 120}), (std::vector<std::size_t>{0, 2}));
@@ -43,10 +43,6 @@ TEST(NotebookPageTest, FindsByBoundsFromTheLowestUpAfterEveryEdit) {
     page.Undo();
     EXPECT_EQ(page.Find({0, 0, 1200, 1000}), (std::vector<std::size_t>{0, 1, 2}));
     EXPECT_TRUE(page.Find({300, 90, 400, 120}).empty());
-}
-
-TEST(NotebookPageTest, IsAsLongAsItIsWritten) {
-    Page page;
     EXPECT_EQ(page.GetHeight(), Page::kMinHeight);
     page.Append(MakeDash(0, 99'000));
     EXPECT_EQ(page.GetHeight(), 99'403);

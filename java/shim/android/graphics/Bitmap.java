@@ -5,11 +5,11 @@ import java.nio.ByteBuffer;
 import java.util.Objects;
 
 /**
- * What the SDK uses of Android's class, for a desktop Java: four bytes a pixel, R, G, B, A, premultiplied,
- * rows without padding.
+ * The parts of Android's class that the SDK uses, for desktop Java: four bytes a pixel, R, G, B, A, premultiplied, rows
+ * without padding.
  */
 public final class Bitmap {
-    /** How a pixel is stored. This class only makes {@code ARGB_8888}. */
+    /** The format of pixels. This class supports only {@code ARGB_8888}. */
     public enum Config { ALPHA_8, RGB_565, ARGB_4444, ARGB_8888, RGBA_F16, HARDWARE }
 
     private static final int BYTES_PER_PIXEL = 4;
@@ -18,7 +18,7 @@ public final class Bitmap {
     private final int height;
     private byte[] pixels;
 
-    /** Takes the pixels over. */
+    /** Uses the array without copying it. */
     Bitmap(int width, int height, byte[] pixels) {
         this.width = width;
         this.height = height;
@@ -54,7 +54,7 @@ public final class Bitmap {
         pixels = null;
     }
 
-    /** Copies all rows to the buffer's position and moves that behind them. */
+    /** Copies all rows to the buffer's position and advances the position. */
     public void copyPixelsToBuffer(Buffer target) {
         byte[] source = requirePixels();
         if (target.remaining() < source.length) {
@@ -63,7 +63,7 @@ public final class Bitmap {
         ((ByteBuffer) target).put(source);
     }
 
-    /** The source itself when it has that size already. Without filter, the nearest pixel is taken. */
+    /** Returns the source itself if it has that size. Without filter, uses the nearest pixel. */
     public static Bitmap createScaledBitmap(Bitmap source, int width, int height, boolean filter) {
         Objects.requireNonNull(source);
         if (width <= 0 || height <= 0) {
@@ -90,7 +90,7 @@ public final class Bitmap {
         return new Bitmap(width, height, to);
     }
 
-    /** Every n x n block of pixels, averaged; what is left over at the right and the bottom is dropped. */
+    /** Averages every n x n block of pixels. Incomplete blocks at the right and the bottom are dropped. */
     Bitmap averageBlocks(int n) {
         byte[] from = requirePixels();
         int smallWidth = width / n;
@@ -118,7 +118,7 @@ public final class Bitmap {
         return pixels;
     }
 
-    /** Where the new pixels of a row or a column lie between the old ones. */
+    /** The positions of the new pixels of a row or a column between the old ones. */
     private static final class Axis {
         final int[] low;
         final int[] high;
@@ -129,7 +129,7 @@ public final class Bitmap {
             high = new int[to];
             weight = new float[to];
             for (int i = 0; i < to; ++i) {
-                // Centre on centre, and never beyond the outermost pixels.
+                // Aligns pixel centres, and clamps to the outermost pixels.
                 float position = Math.max(0, (i + 0.5f) * from / to - (filter ? 0.5f : 0));
                 low[i] = Math.min((int) position, from - 1);
                 high[i] = Math.min(low[i] + 1, from - 1);

@@ -11,25 +11,25 @@ import javax.imageio.ImageIO;
 import javax.imageio.ImageReader;
 import javax.imageio.stream.ImageInputStream;
 
-/** What the SDK uses of Android's class, over the decoders that a desktop Java has: JPEG, PNG, GIF, BMP. */
+/** The parts of Android's class that the SDK uses, with the decoders of desktop Java: JPEG, PNG, GIF, BMP. */
 public final class BitmapFactory {
     private BitmapFactory() {}
 
-    /** How to decode, and what was found. */
+    /** The options of a decode, and its results. */
     public static class Options {
-        /** Whether to find out the size only. */
+        /** If true, only the size is read. */
         public boolean inJustDecodeBounds;
-        /** How many pixels, each way, become one; below 1 it counts as 1. */
+        /** The number of pixels, in each direction, that become one; values below 1 mean 1. */
         public int inSampleSize;
-        /** Only {@code ARGB_8888} is made. */
+        /** The format; only {@code ARGB_8888} is supported. */
         public Bitmap.Config inPreferredConfig = Bitmap.Config.ARGB_8888;
-        /** The width, -1 when the file cannot be read. */
+        /** The width, or -1 if the file cannot be read. */
         public int outWidth;
-        /** The height, -1 when the file cannot be read. */
+        /** The height, or -1 if the file cannot be read. */
         public int outHeight;
     }
 
-    /** The bitmap; null when the file cannot be read or only its bounds were asked for. */
+    /** Returns the bitmap; null if the file cannot be read or only its bounds were requested. */
     public static Bitmap decodeFile(String path, Options options) {
         options.outWidth = -1;
         options.outHeight = -1;
@@ -46,7 +46,7 @@ public final class BitmapFactory {
                 reader.dispose();
             }
         } catch (IOException | RuntimeException e) {
-            // The readers meet a broken file with exceptions of any kind.
+            // For a broken file, readers throw exceptions of any type.
             return null;
         }
     }
@@ -85,7 +85,7 @@ public final class BitmapFactory {
         return pixels;
     }
 
-    /** By the samples themselves: getRGB takes gray for linear light, which image files do not hold. */
+    /** Reads the samples directly, because getRGB treats grey as linear light, which image files do not contain. */
     private static void readGrayRow(BufferedImage image, int y, int[] row) {
         Raster raster = image.getRaster();
         int shift = raster.getSampleModel().getSampleSize(0) - 8;
@@ -97,7 +97,7 @@ public final class BitmapFactory {
         }
     }
 
-    /** Rounded to the nearest. */
+    /** Rounds to the nearest. */
     private static byte premultiply(int colour, int alpha) {
         return (byte) (((colour & 0xff) * alpha * 2 + 255) / 510);
     }

@@ -7,7 +7,7 @@ uniform vec4 uTintColor;
 uniform int uHasTintColor;
 
 varying highp float alphaAA;
-varying highp vec2 vUV; // 16 bits cannot tell the texels of a wide bitmap apart
+varying highp vec2 vUV; // 16 bits cannot distinguish the texels of a wide bitmap
 
 void main() {
     vec4 texel = texture2D(uSrcTexture, vUV);

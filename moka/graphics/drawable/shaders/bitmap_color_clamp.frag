@@ -7,7 +7,7 @@ uniform vec4 uTintColor;
 uniform int uHasTintColor;
 
 varying highp float alphaAA;
-varying highp vec2 vUV; // 16 bits cannot tell the texels of a wide bitmap apart
+varying highp vec2 vUV; // 16 bits cannot distinguish the texels of a wide bitmap
 
 void main() {
     vec4 texel = texture2D(uSrcTexture, vUV);
@@ -16,7 +16,7 @@ void main() {
         a *= uTintColor.a * texel.a;
         gl_FragColor = vec4(uTintColor.rgb * a, a);
     } else {
-        // No channel exceeds alpha, whatever the texture holds.
+        // Limits every channel to alpha.
         vec4 color = texel * a;
         gl_FragColor = clamp(color, vec4(0.0), vec4(color.a));
     }

@@ -10,14 +10,14 @@ uniform vec2 uRxry;
 
 varying vec4 vCircleCoord;
 
-// The square of the distance from the corner's centre, in units of the ellipse's radii: 1 on the ellipse.
+// Returns the squared distance from the corner's centre, in units of the ellipse's radii: 1 on the ellipse.
 float onEllipse(vec2 radii) {
     vec2 d = vCircleCoord.xy - vCircleCoord.zw;
     vec2 squares = (d * d) / (radii * radii);
     return squares.x + squares.y;
 }
 
-// The x radii give the width of the ramp on both axes. // Compat: corner-ramp
+// Both axes use the ramp width of the x radii. // Compat: corner-ramp
 float rampWidth(float outer, float inner) {
     return (outer * outer) / (inner * inner) - 1.0;
 }

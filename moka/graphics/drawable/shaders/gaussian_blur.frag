@@ -11,7 +11,7 @@ in vec2 texCoord;
 
 out vec4 fragColor;
 
-// From the centre outwards.
+// The weights of the samples, from the centre outwards.
 const float kWeights[5] = float[](0.227027, 0.1945946, 0.1216216, 0.054054, 0.016216);
 
 void main() {

@@ -4,41 +4,39 @@ precision mediump float;
 uniform vec4 uColor;
 uniform vec4 uTintColor;
 uniform int uHasTintColor;
-// Positions, lengths and distances are highp: a mediump float may have 16 bits, which overflow when a distance
-// above 256 is squared.
+// Positions, lengths and distances are highp: a mediump float may have 16 bits, which overflow when a
+// distance above 256 is squared.
 uniform highp vec2 uLineInfo; // half the width, the length
 uniform int uIsDashedLine;
-uniform highp vec4 uDashedLinePattern; // where dash, gap, dash, gap end
+uniform highp vec4 uDashedLinePattern; // the ends of dash, gap, dash, gap
 uniform highp float uDashedLinePatternLength;
 uniform int uLineCapType; // 0 butt, 1 round, else square
 
 varying highp vec2 vLineCoord;
 
-// An edge that does not exist on its side.
+// The position of an edge that does not exist.
 const highp float kNowhere = 100000.0;
 
-// Whether x lies in [low, high].
 bool within(highp float x, highp float low, highp float high) {
     return low <= x && x <= high;
 }
 
-// Along a line without dashes.
+// Returns the coverage along a line without dashes.
 float alongSolid(highp vec2 at, highp float halfWidth, highp float lineLength) {
     if (uLineCapType == 0) {
-        // Both ends of a line shorter than a pixel may lie in one pixel: then the begin counts on the line, and
-        // the end behind it.
+        // Both ends of a line shorter than a pixel may lie in one pixel. Then its beginning counts for
+        // positions on the line, and its end for those after it.
         bool isAtBegin = at.x < 0.5 && at.x <= lineLength;
         return clamp(0.5 + (isAtBegin ? at.x : lineLength - at.x), 0.0, 1.0);
     }
-    highp float beyond = max(max(-at.x, at.x - lineLength), 0.0); // an end, by so much
+    highp float beyond = max(max(-at.x, at.x - lineLength), 0.0); // the distance beyond an end
     if (uLineCapType == 1) return clamp(0.5 + halfWidth - length(vec2(beyond, at.y)), 0.0, 1.0);
     return clamp(0.5 + halfWidth - beyond, 0.0, 1.0);
 }
 
-// A stretch along the line: a dash, when inside, or what lies between the end of one and the begin of the
-// next.
+// A dash (inside is true), or the gap between two dashes.
 struct Stretch {
-    highp float x; // where in it the fragment lies; of a dashed line the place in the pattern
+    highp float x; // the fragment's position along the line; in a dashed line, its position in the pattern
     highp float left;
     highp float right;
     bool inside;
@@ -46,7 +44,7 @@ struct Stretch {
 
 Stretch dashed(highp float x, highp float halfWidth, highp float lineLength) {
     highp vec4 p = uDashedLinePattern;
-    highp float rest = mod(lineLength, uDashedLinePatternLength); // where in the pattern the line ends
+    highp float rest = mod(lineLength, uDashedLinePatternLength); // where the line ends in the pattern
     highp float cx = mod(x, uDashedLinePatternLength);
     if (x >= lineLength) {
         if (within(rest, 0.0, p.x) || within(rest, p.y, p.z)) return Stretch(x, lineLength, kNowhere, false);
@@ -60,7 +58,7 @@ Stretch dashed(highp float x, highp float halfWidth, highp float lineLength) {
     } else if (cx < p.z) {
         s = Stretch(cx, p.y, p.z, true);
     }
-    // A line that ends in a gap has no next dash whose cap could reach back.
+    // After a line that ends in a gap there is no dash whose cap could extend back.
     bool endsInGap = within(rest, p.x, p.y) || within(rest, p.z, p.w);
     if (x >= lineLength - halfWidth - 0.5 && !s.inside && endsInGap) s.right = kNowhere;
     return s;
@@ -73,7 +71,7 @@ float alongInside(Stretch s) {
     return 1.0;
 }
 
-// The caps of the dashes on both sides.
+// Returns the coverage by the caps of the dashes on both sides.
 float alongOutside(Stretch s, highp float y, highp float halfWidth) {
     float left;
     float right;

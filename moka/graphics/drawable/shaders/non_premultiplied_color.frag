@@ -12,7 +12,7 @@ void main() {
     vec4 s = texture(srcTexture, texCoord);
     vec4 d = texture(dstTexture, texCoord);
     vec4 f = s + d * (1.0 - s.a);
-    // Where both are transparent the division gives what it gives.
+    // If both are transparent the result of the division is undefined.
     f.rgb /= f.a;
     fragColor = clamp(f, 0.0, 1.0);
 }

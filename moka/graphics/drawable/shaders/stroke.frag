@@ -1,10 +1,10 @@
 #version 300 es
-// Each pixel of a stroke lies in one cell, which knows all segments that can cover it: the coverage is their
-// maximum, and the pixel is blended once. The position comes from gl_FragCoord and not from the vertices, so
-// that all cells compute the same one, and no pixel is in two cells or in none.
+// Each pixel of a stroke lies in one cell, which contains all segments that can cover it. The coverage is
+// their maximum, so the pixel is blended once. The position comes from gl_FragCoord, not from the vertices,
+// so that all cells compute the same one, and no pixel is in two cells or in none.
 precision highp float;
 
-// From the target's pixels to the canvas's, homogeneous.
+// The rows of the matrix from the target's pixels to the canvas, in homogeneous coordinates.
 uniform vec4 uToCanvasX;
 uniform vec4 uToCanvasY;
 uniform vec4 uToCanvasW;
@@ -19,15 +19,15 @@ flat in vec4 vColor;
 
 out vec4 fragColor;
 
-// The discs from a to b, each x, y and radius, at position. pixels has what a device pixel to the right and one
-// down are on the canvas.
+// Returns the coverage at position by all discs between a and b, each (x, y, radius). The columns of pixels
+// are the steps on the canvas of one device pixel along x and along y.
 float Cover(vec2 position, vec3 a, vec3 b, mat2 pixels) {
     vec2 line = b.xy - a.xy;
     vec2 to = position - a.xy;
     float growth = b.z - a.z;
     float square = dot(line, line);
     float rest = square - growth * growth;
-    // The disc whose edge is nearest. One end may contain the other.
+    // Find the disc whose edge is nearest. If one end contains the other, that is the larger end.
     float t = growth > 0.0 ? 1.0 : 0.0;
     if (rest > 0.0) {
         float across = abs(to.x * line.y - to.y * line.x);
@@ -36,7 +36,7 @@ float Cover(vec2 position, vec3 a, vec3 b, mat2 pixels) {
     vec2 away = to - line * t;
     float radius = mix(a.z, b.z, t);
     float apart = length(away);
-    // By so much the distance changes over one device pixel.
+    // The change of the distance over one device pixel.
     float pixel = apart > 0.0 ? length(away * pixels) / apart : length(pixels[0]);
     float coverage = clamp(0.5 + (max(radius, 0.5 * pixel) - apart) / pixel, 0.0, 1.0);
     return coverage * min(1.0, 2.0 * radius / pixel);

@@ -5,10 +5,10 @@ uniform mat4 uProjectionMatrix;
 uniform vec4 uColor;
 uniform vec4 uTintColor;
 uniform int uHasTintColor;
-uniform float uMargin; // canvas pixels by which the corners lie outside of the cell
+uniform float uMargin; // distance of the corners from the cell, in canvas pixels
 
-in vec4 aCell;    // left, top, side; 4 * the segments' bits + the number of the corner
-in vec4 aPoints0; // three times six: x and y from the cell's corner, radius
+in vec4 aCell;    // left, top, side; 4 * the segments' bits + the index of the corner
+in vec4 aPoints0; // six points: x and y relative to the cell's corner, radius
 in vec4 aPoints1;
 in vec4 aPoints2;
 in vec4 aPoints3;

@@ -11,9 +11,9 @@ public final class MokaBitmapFactory {
      * Decodes an image file into a bitmap of the configuration {@code ARGB_8888}, premultiplied.
      *
      * @param path   the file
-     * @param width  how wide the bitmap is to be; 0 or less, here or in height, means the file's own size
-     * @param height how high the bitmap is to be
-     * @return the bitmap, which is the caller's to recycle; null when the file cannot be read
+     * @param width  the width of the bitmap; if width or height is 0 or less, the bitmap has the file's own size
+     * @param height the height of the bitmap
+     * @return the bitmap, which the caller recycles; null if the file cannot be read
      */
     public static Bitmap decodeFile(String path, int width, int height) {
         boolean isScaled = width > 0 && height > 0;
@@ -33,7 +33,7 @@ public final class MokaBitmapFactory {
         return scaled;
     }
 
-    /** The decoder shrinks well by powers of two only: as far as the bitmap does not get too small. */
+    /** The largest power of two by which the decoder can reduce the image without making it too small. */
     private static int chooseSampleSize(String path, int width, int height) {
         BitmapFactory.Options bounds = new BitmapFactory.Options();
         bounds.inJustDecodeBounds = true;

@@ -3,15 +3,15 @@ package com.velmora.android.sdk.pen.graphics;
 import java.util.concurrent.atomic.AtomicBoolean;
 
 /**
- * Lends the native bitmap loader its thread. The native library makes one of these while it is being loaded;
- * an application has no need to.
+ * Provides the thread of the native bitmap loader. The native library creates one object while it is being loaded;
+ * applications need not create any.
  */
 public final class MokaBitmapLoader {
     private static final AtomicBoolean started = new AtomicBoolean();
 
     /**
-     * Starts the loader's thread, a daemon, which serves requests until the process ends. There is one in a
-     * process: constructing another loader starts nothing, since two would serve each request twice.
+     * Starts the loader's thread, a daemon, which handles requests until the process ends. A process has one such thread:
+     * constructing another loader starts none, because two would process each request twice.
      */
     public MokaBitmapLoader() {
         if (!started.compareAndSet(false, true)) {

@@ -1,14 +1,14 @@
 package com.velmora.android.sdk.pen.view;
 
 /**
- * The metrics of the device's screen, kept where native code can read them. Not synchronised. Needs the
- * native library to be loaded.
+ * The metrics of the device's screen, stored in a native object for native code. Not synchronised. The native library
+ * must be loaded.
  */
 public final class MokaDisplay implements AutoCloseable {
     private long handle;
 
     /**
-     * Makes the native display. The numbers of direction and orientations are handed on as they are.
+     * Creates the native display. The numbers of direction and orientations are stored unchanged.
      *
      * @param widthPixels         the screen's width
      * @param heightPixels        the screen's height
@@ -51,8 +51,7 @@ public final class MokaDisplay implements AutoCloseable {
     }
 
     /**
-     * Takes over everything from another display, except the density in dots per inch and whether the device
-     * is a tablet.
+     * Copies all values of another display, except the density in dots per inch and whether the device is a tablet.
      *
      * @param source the other display
      */
@@ -61,7 +60,7 @@ public final class MokaDisplay implements AutoCloseable {
     }
 
     /**
-     * Sets the level that native code debugs at; 0 at first.
+     * Sets the debug level of native code; initially 0.
      *
      * @param level the level
      */
@@ -70,7 +69,7 @@ public final class MokaDisplay implements AutoCloseable {
     }
 
     /**
-     * Sets the screen's orientation, and nothing else.
+     * Sets the screen's orientation.
      *
      * @param orientation the orientation
      */
