@@ -13,6 +13,7 @@ namespace {
 
 constexpr int kWidth = 8;
 constexpr int kHeight = 4;
+constexpr float kCorners[][2] = {{0, 0}, {1, 0}, {0, 1}, {1, 1}};
 constexpr Color kBackground{10, 20, 30, 40};
 Vector4<float> const kColor(0.9f, 0.5f, 0.2f, 0.8f);
 Vector4<float> const kTint(0.1f, 0.7f, 1.0f, 0.6f);
@@ -38,21 +39,20 @@ Rgba At(Picture const& image, double x, double y) {
 // What is drawn at a point, in pixels; nothing where the fragment is discarded.
 using Reference = std::function<std::optional<Rgba>(double x, double y)>;
 
-// The class's shader for a scope.
-template <class T>
-class SharedShader {
-public:
-    SharedShader() : mShader(ShaderManager::GetInstance()->GetShader<T>()) {
-        mShader->program->MakeCurrent();
+struct ReleaseShader {
+    template <class T>
+    void operator()(T* shader) const {
+        ShaderManager::GetInstance()->ReleaseShader(shader);
     }
-    ~SharedShader() { ShaderManager::GetInstance()->ReleaseShader(mShader); }
-    SharedShader(SharedShader const&) = delete;
-    SharedShader& operator=(SharedShader const&) = delete;
-    T* operator->() const { return mShader; }
-
-private:
-    T* const mShader;
 };
+
+// The class's shader, current.
+template <class T>
+std::unique_ptr<T, ReleaseShader> Use() {
+    std::unique_ptr<T, ReleaseShader> shader(ShaderManager::GetInstance()->GetShader<T>());
+    shader->program->MakeCurrent();
+    return shader;
+}
 
 // Premultiplied, every alpha from 0 to 255, colours that differ in all channels.
 Picture MakeSource(int seed) {
@@ -71,18 +71,7 @@ Picture MakeSource(int seed) {
 
 class ShaderTest : public RendererFixture {
 protected:
-    void SetUp() override {
-        RendererFixture::SetUp();
-        mTexture = MakeTexture(kWidth, kHeight);
-        mTarget = MakeTarget(*mTexture);
-        mTarget->Activate();
-    }
-    void TearDown() override {
-        mSources.clear();
-        mTarget.reset();
-        mTexture.reset();
-        RendererFixture::TearDown();
-    }
+    ShaderTest() { mTarget->Activate(); }
 
     // On units 0, 1, ...
     void Bind(std::initializer_list<Picture> images) {
@@ -97,36 +86,28 @@ protected:
         return Matrix4<float>::orthoMatrix(0, kWidth, 0, kHeight, -1, 1);
     }
 
-    // Over the whole target, which has an attribute of what values(x, y) gives at its corners.
-    template <class... Functions>
-    Picture Draw(Functions... values) {
-        auto const atCorners = [](auto const& value) {
-            RawAttribute attribute{};
-            for (int corner = 0; corner < 4; ++corner) {
-                int const x = corner % 2 * kWidth;
-                int const y = corner / 2 * kHeight;
-                auto const at = value(static_cast<float>(x), static_cast<float>(y));
-                attribute.components = static_cast<int>(at.size());
-                attribute.values.insert(attribute.values.end(), at.begin(), at.end());
-            }
-            return attribute;
-        };
-        Clear(*mTarget, kBackground);
-        DrawRawStrip({atCorners(values)...});
-        return Read(*mTarget, kWidth, kHeight);
+    // Over the whole target; the attributes are place and coverage, and texture coordinates.
+    Picture DrawCovered() {
+        RawAttribute covered{3, {}};
+        RawAttribute texture{2, {}};
+        for (auto const& [u, v] : kCorners) {
+            covered.values.insert(covered.values.end(), {u * kWidth, v * kHeight, 0.25f + u / 2});
+            texture.values.insert(texture.values.end(), {u, v});
+        }
+        return Draw({covered, texture});
     }
     static double Coverage(double x) { return 0.25 + x / 16; }
-    Picture DrawCovered() {
-        return Draw(
-            [](float x, float y) {
-                return std::vector<float>{x, y, 0.25f + x / 16};
-            },
-            [](float x, float y) {
-                return std::vector<float>{x / kWidth, y / kHeight};
-            });
-    }
+    // The attribute is place and texture coordinates.
     Picture DrawWhole() {
-        return Draw([](float x, float y) { return std::vector<float>{x, y, x / kWidth, y / kHeight}; });
+        RawAttribute whole{4, {}};
+        for (auto const& [u, v] : kCorners)
+            whole.values.insert(whole.values.end(), {u * kWidth, v * kHeight, u, v});
+        return Draw({whole});
+    }
+    Picture Draw(std::initializer_list<RawAttribute> attributes) {
+        Clear(*mTarget, kBackground);
+        DrawRawStrip(attributes);
+        return Read(*mTarget, kWidth, kHeight);
     }
 
     static void Expect(Picture const& drawn, Reference const& reference) {
@@ -144,8 +125,8 @@ protected:
     }
 
 private:
-    TexturePtr mTexture;
-    TargetPtr mTarget;
+    TexturePtr mTexture = MakeTexture(kWidth, kHeight);
+    TargetPtr mTarget = MakeTarget(*mTexture);
     std::vector<TexturePtr> mSources;
 };
 
@@ -154,7 +135,7 @@ TEST_F(ShaderTest, TheClampKeepsColoursBelowAlphaAndTouchesNothingElse) {
     source.SetColor(3, 0, {255, 100, 7, 50});
     source.SetColor(4, 3, {255, 255, 255, 0});
     Bind({source});
-    SharedShader<MKBitmapShaderColorClamp> const shader;
+    auto const shader = Use<MKBitmapShaderColorClamp>();
     shader->uProjectionMatrix = GetProjection();
     shader->uColor = kColor;
     shader->uTintColor = kTint;
@@ -175,7 +156,7 @@ TEST_F(ShaderTest, TheBlenderMixesAndIgnoresCoverageAndColours) {
     Picture const first = MakeSource(3);
     Picture const second = MakeSource(4);
     Bind({first, second});
-    SharedShader<MKBlenderBitmapsShader> const shader;
+    auto const shader = Use<MKBlenderBitmapsShader>();
     shader->uProjectionMatrix = GetProjection();
     shader->uColor = kColor;
     shader->uTintColor = kTint;
@@ -193,7 +174,7 @@ TEST_F(ShaderTest, TheBlenderMixesAndIgnoresCoverageAndColours) {
 TEST_F(ShaderTest, TheTextMaskDrawsItsColourWhereTheMaskIs) {
     Picture const mask = MakeSource(0);
     Bind({mask});
-    SharedShader<MKTextMaskBitmapShader> const shader;
+    auto const shader = Use<MKTextMaskBitmapShader>();
     shader->uProjectionMatrix = GetProjection();
     shader->uSrcTexture = 0;
     shader->uMaskColor = kColor; // its alpha is not read
@@ -208,7 +189,7 @@ TEST_F(ShaderTest, OneBitmapOverAnotherLeavesNotPremultiplied) {
     Picture const source = MakeSource(1);
     Picture const destination = MakeSource(6);
     Bind({source, destination});
-    SharedShader<MKNonPremultipliedColorShader> const shader;
+    auto const shader = Use<MKNonPremultipliedColorShader>();
     shader->projectionMatrix = GetProjection();
     shader->srcTexture = 0;
     shader->dstTexture = 1;
@@ -225,7 +206,7 @@ TEST_F(ShaderTest, OneBitmapOverAnotherLeavesNotPremultiplied) {
 TEST_F(ShaderTest, TheBlurWeighsFourNeighboursOnEachSideOfOneAxis) {
     Picture const source = MakeSource(2);
     Bind({source});
-    SharedShader<MKGaussianBlurShader> const shader;
+    auto const shader = Use<MKGaussianBlurShader>();
     shader->projectionMatrix = GetProjection();
     shader->srcTexture = 0;
     shader->uTintColor = kTint;

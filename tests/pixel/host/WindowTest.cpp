@@ -5,7 +5,6 @@
 #include "moka/graphics/MokaGraphics.h"
 #include "moka/host/RenderThread.h"
 #include "tests/pixel/host/XWindow.h"
-#include "tests/support/Awaited.h"
 #include "tests/support/LogCapture.h"
 
 #include <gmock/gmock.h>
@@ -16,7 +15,6 @@
 #include <chrono>
 #include <cstdlib>
 #include <future>
-#include <memory>
 #include <thread>
 
 namespace {

@@ -10,10 +10,6 @@
 #include "moka/renderer/IParameterBinding.h"
 #include "moka/renderer/IRasterizerState.h"
 
-#include <array>
-#include <memory>
-#include <string>
-
 namespace Moka::Testing {
 
 using ParameterPtr = std::unique_ptr<IParameterBinding>;
@@ -42,40 +38,19 @@ struct Brush {
     ParameterPtr parameter;
 };
 
+// Of triangles with so many attributes of two floats.
+inline GraphicsPtr MakeGraphics(int attributes) {
+    VertexDescriptor layout;
+    for (int i = 0; i < attributes; ++i) layout.addAttribute(VertexAttributeType::Float, 2, -1, 0);
+    return GraphicsPtr(RendererFactory::CreateGraphicsObject(1, PrimitiveType::TriangleList, &layout, 0, 0));
+}
+
 class DrawFixture : public RendererFixture, public ::testing::WithParamInterface<bool> {
 protected:
-    void SetUp() override {
-        RendererFixture::SetUp();
-        Begin();
-    }
-    void TearDown() override {
-        End();
-        RendererFixture::TearDown();
-    }
-
-    void Begin() {
+    DrawFixture() {
         RendererFactory::SetDeferred(GetParam());
-        texture = MakeTexture(kSize, kSize);
-        target = MakeTarget(*texture);
-        colored = std::make_unique<Brush>(kColored, "color");
-        textured = std::make_unique<Brush>(kTextured, "texel");
-        VertexDescriptor layout;
-        layout.addAttribute(VertexAttributeType::Float, 2, -1, 0);
-        quad.reset(RendererFactory::CreateGraphicsObject(1, PrimitiveType::TriangleList, &layout, 0, 0));
-        blend.reset(RendererFactory::CreateBlendStateObject(BlendStateDescriptor(true)));
-        stencil.reset(RendererFactory::CreateDepthStencilState(DepthStencilStateDescriptor(false, false)));
         blend->Apply();
         stencil->Apply();
-    }
-
-    void End() {
-        quad.reset();
-        blend.reset();
-        stencil.reset();
-        colored.reset();
-        textured.reset();
-        target.reset();
-        texture.reset();
     }
 
     void SetQuad(float l, float t, float r, float b) const {
@@ -83,21 +58,18 @@ protected:
         quad->SetVertices(0, corners, 6);
         quad->SetBounds({l / 4 - 1, t / 4 - 1, r / 4 - 1, b / 4 - 1});
     }
-    void Fill(Color color, float l, float t, float r, float b) const { Fill(*colored, color, l, t, r, b); }
+    void Fill(Color color, float l, float t, float r, float b) const { Fill(colored, color, l, t, r, b); }
     void Fill(Brush const& brush, Color color, float l, float t, float r, float b) const {
-        std::array<float, 4> const value{
-            static_cast<float>(color[0]) / 255, static_cast<float>(color[1]) / 255,
-            static_cast<float>(color[2]) / 255, static_cast<float>(color[3]) / 255};
         brush.program->MakeCurrent();
-        brush.parameter->Set(value.data());
+        brush.parameter->Set(ToFloats(color).data());
         SetQuad(l, t, r, b);
         EXPECT_TRUE(quad->Draw(0, -1, 1));
     }
     void Paint(ITextureObject& source, float l, float t, float r, float b) const {
         int const unit = 1;
         source.Bind(unit);
-        textured->program->MakeCurrent();
-        textured->parameter->Set(&unit);
+        textured.program->MakeCurrent();
+        textured.parameter->Set(&unit);
         SetQuad(l, t, r, b);
         EXPECT_TRUE(quad->Draw(0, -1, 1));
     }
@@ -113,16 +85,15 @@ protected:
     static Picture With(Picture image, Color color, int x, int y, int w, int h) {
         return image.With(x, y, MakeImage(w, h, color));
     }
-    static RendererStatistics Count() { return RendererFactory::GetStatistics(); }
     static bool IsDeferred() { return GetParam(); }
 
-    TexturePtr texture;
-    TargetPtr target;
-    std::unique_ptr<Brush> colored;
-    std::unique_ptr<Brush> textured;
-    GraphicsPtr quad;
-    BlendPtr blend;
-    StatePtr stencil;
+    TexturePtr texture = MakeTexture(kSize, kSize);
+    TargetPtr target = MakeTarget(*texture);
+    Brush const colored{kColored, "color"};
+    Brush const textured{kTextured, "texel"};
+    GraphicsPtr quad = MakeGraphics(1);
+    BlendPtr blend{RendererFactory::CreateBlendStateObject(BlendStateDescriptor(true))};
+    StatePtr stencil{RendererFactory::CreateDepthStencilState(DepthStencilStateDescriptor(false, false))};
 };
 
 } // namespace Moka::Testing

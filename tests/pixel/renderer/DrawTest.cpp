@@ -37,9 +37,9 @@ TEST_P(DrawTest, AFlushIsAGroupForGlDebuggers) {
 
 TEST_P(DrawTest, CountsAndFirstAreCutToWhatIsThere) {
     target->Activate();
-    colored->program->MakeCurrent();
+    colored.program->MakeCurrent();
     std::array<float, 4> const red{1, 0, 0, 1};
-    colored->parameter->Set(red.data());
+    colored.parameter->Set(red.data());
     float const two[] = {0, 0, 0, 4, 8, 0, 0, 8, 0, 4, 8, 8, 8, 8};
     quad->SetVertices(0, two, 7);
     EXPECT_TRUE(quad->Draw(3, 3, 1));
@@ -105,8 +105,8 @@ TEST_P(DrawTest, AnImageIsDrawnOntoItselfWithMoreVerticesThanAListHolds) {
     Fill({100, 0, 0, 255}, 0, 0, 8, 8);
     int const unit = 1;
     texture->Bind(unit);
-    textured->program->MakeCurrent();
-    textured->parameter->Set(&unit);
+    textured.program->MakeCurrent();
+    textured.parameter->Set(&unit);
     std::vector<float> corners{0, 0, 0, 8, 8, 0, 8, 0, 0, 8, 8, 8};
     corners.resize(300000); // the others are a point
     quad->SetVertices(0, corners.data(), 150000);

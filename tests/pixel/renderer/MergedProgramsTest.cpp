@@ -100,13 +100,7 @@ constexpr int kTargetSize = kColumns * kCell;
 
 class MergedProgramsTest : public RendererFixture {
 protected:
-    void TearDown() override {
-        End();
-        RendererFixture::TearDown();
-    }
-
     void Begin(bool merges) {
-        End();
         RendererFactory::DetachContext();
         RendererLimits limits;
         limits.mergesDraws = merges;
@@ -115,17 +109,7 @@ protected:
         image = MakeOffscreen(MakeImage(kTargetSize, kTargetSize, kClear));
         texel = MakeTexture(MakeImage(2, 2, {200, 100, 50, 255}));
         mask = MakeTexture(MakeImage(2, 2, {0, 80, 160, 255}));
-        VertexDescriptor layout;
-        layout.addAttribute(VertexAttributeType::Float, 2, -1, 0);
-        layout.addAttribute(VertexAttributeType::Float, 2, -1, 0);
-        quad.reset(RendererFactory::CreateGraphicsObject(1, PrimitiveType::TriangleList, &layout, 0, 0));
-    }
-    void End() {
-        program.reset();
-        quad.reset();
-        texel.reset();
-        mask.reset();
-        image = {};
+        quad = MakeGraphics(2);
     }
     void MakeProgram(Texts const& texts) {
         program.reset(RendererFactory::CreateShaderProgram(texts.vertex, texts.fragment, "foreign"));
@@ -176,9 +160,9 @@ protected:
     }
     // The draw calls that it takes.
     int Flush() const {
-        std::uint64_t const before = RendererFactory::GetStatistics().draws;
+        std::uint64_t const before = Count().draws;
         RendererFactory::Flush();
-        return static_cast<int>(RendererFactory::GetStatistics().draws - before);
+        return static_cast<int>(Count().draws - before);
     }
     Picture ReadTarget() const { return RendererFixture::Read(*image.target, kTargetSize, kTargetSize); }
 
@@ -220,8 +204,8 @@ TEST_F(MergedProgramsTest, ThoseThatAreUnderstoodDrawWithOneCallAndOthersOneByOn
                   texts.isMerged ? 0 : 1);
         EXPECT_EQ(log.Count(ANDROID_LOG_ERROR), 0);
         EXPECT_LE(CompareImages(ReadTarget(), expected).largest, texts.isMerged ? 1 : 0);
-        EXPECT_EQ(RendererFactory::GetStatistics().errors, 0u);
-        EXPECT_EQ(RendererFactory::GetStatistics().variants, texts.isMerged ? 1 : 0);
+        EXPECT_EQ(Count().errors, 0u);
+        EXPECT_EQ(Count().variants, texts.isMerged ? 1 : 0);
     }
 }
 
@@ -238,7 +222,7 @@ TEST_F(MergedProgramsTest, AFullBlockIsOneCallAndWhatIsLeftAnother) {
         DrawCells(draws);
         EXPECT_EQ(Flush(), calls) << draws;
         EXPECT_EQ(CompareImages(ReadTarget(), expected).largest, 0) << draws;
-        EXPECT_EQ(RendererFactory::GetStatistics().runEnds[static_cast<std::size_t>(RunEnd::Full)],
+        EXPECT_EQ(Count().runEnds[static_cast<std::size_t>(RunEnd::Full)],
                   static_cast<std::uint64_t>(calls - 1));
     }
 }
@@ -276,12 +260,12 @@ TEST_F(MergedProgramsTest, AProgramHasSixteenVariantsAtMostAndTakesThemWithIt) {
         DrawCells(32);
         EXPECT_EQ(Flush(), 1) << number;
         EXPECT_EQ(ReadTarget().GetColor(1, 1)[3], number);
-        EXPECT_EQ(RendererFactory::GetStatistics().variants, std::min(number + 1, 16));
+        EXPECT_EQ(Count().variants, std::min(number + 1, 16));
     }
     EXPECT_EQ(CountGlPrograms(), before + 17);
     program.reset();
     EXPECT_EQ(CountGlPrograms(), before);
-    EXPECT_EQ(RendererFactory::GetStatistics().variants, 0);
+    EXPECT_EQ(Count().variants, 0);
 }
 
 } // namespace

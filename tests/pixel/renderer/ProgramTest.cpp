@@ -40,15 +40,7 @@ GLuint MakeCurrent(ProgramPtr const& program) {
 
 class ProgramTest : public RendererFixture {
 protected:
-    void SetUp() override {
-        RendererFixture::SetUp();
-        mImage = MakeOffscreen(MakeImage(2, 2));
-        mImage.target->Activate();
-    }
-    void TearDown() override {
-        mImage = {};
-        RendererFixture::TearDown();
-    }
+    ProgramTest() { mImage.target->Activate(); }
 
     // What the current program draws over the whole target.
     Color Draw() {
@@ -61,7 +53,7 @@ protected:
         return image.GetColor(0, 0);
     }
 
-    OffscreenImage mImage;
+    OffscreenImage mImage = MakeOffscreen(MakeImage(2, 2));
 };
 
 TEST_F(ProgramTest, AttributesTakeTheirLocationsInTheOrderOfTheText) {
@@ -143,15 +135,15 @@ TEST_F(ProgramTest, SourcesThatDoNotCompileOrLinkMakeAProgramThatDrawsNothing) {
         {"uniform vec4 misspelt;", "{", ""},
     };
     for (auto const& [vertex, fragment, stage] : cases) {
-        std::uint64_t const errors = RendererFactory::GetStatistics().errors;
+        std::uint64_t const errors = Count().errors;
         ProgramPtr const program = MakeProgram(vertex, fragment, "BrokenProgram");
         ASSERT_TRUE(program);
         std::vector<std::string> const lines = TakeErrors();
         ASSERT_EQ(lines.size(), 1u) << stage;
         EXPECT_THAT(lines[0], AllOf(HasSubstr("BrokenProgram"), HasSubstr(stage)));
         EXPECT_THAT(lines[0], HasSubstr(*stage ? "misspelt" : "")); // the driver's own words
-        EXPECT_EQ(RendererFactory::GetStatistics().errors, errors + 1);
-        EXPECT_EQ(RendererFactory::GetStatistics().programs, 1);
+        EXPECT_EQ(Count().errors, errors + 1);
+        EXPECT_EQ(Count().programs, 1);
         ParameterPtr const color = Find(program, "color");
         EXPECT_EQ(color->GetType(), BindingTypeUnknown);
         program->MakeCurrent();

@@ -32,29 +32,21 @@ protected:
         Picture model;
     };
 
-    void SetUp() override {
-        DrawFixture::SetUp();
+    RandomWorkTest() {
         // From here on the driver gives deleted names away again.
         glBindFramebuffer(GL_FRAMEBUFFER, kLastName);
         glBindTexture(GL_TEXTURE_2D, kLastName);
         glGenVertexArrays(1, &mHostsArray);
         glGenBuffers(1, &mHostsBuffer);
-        mHost = std::make_unique<HostFrameBuffer>(kSize, kSize);
-        mHostModel = Filled(kUntouched);
     }
-    void TearDown() override {
+    ~RandomWorkTest() override {
         for (GLenum const obstacle : kObstacles) glDisable(obstacle);
-        mMask.reset();
-        mBuffer.reset();
-        mImages = {};
-        mHost.reset();
         glBindVertexArray(0);
         glDeleteVertexArrays(1, &mHostsArray);
         glDeleteBuffers(1, &mHostsBuffer);
         glDeleteFramebuffers(1, &kLastName);
         glDeleteTextures(1, &kLastName);
         RendererFactory::InvalidateState();
-        DrawFixture::TearDown();
     }
 
     void Work(unsigned seed) {
@@ -68,7 +60,7 @@ protected:
         for (int i = 0; i < 120; ++i) Step();
         for (std::size_t i = 0; i < kImages; ++i) ExpectPart(i, {0, 0, kWidths[i], kHeights[i]});
         EndTurn();
-        EXPECT_EQ(mHost->Read(), mHostModel);
+        EXPECT_EQ(mHost.Read(), mHostModel);
         mHostsState.clear();
         RendererFactory::InvalidateState();
     }
@@ -127,7 +119,7 @@ private:
         case 19:
             return PaintImage(any);
         default:
-            return FillBox(*colored, {Below(7), Below(7), 1 + Below(6), 1 + Below(6)}, kColors[Below(5)],
+            return FillBox(colored, {Below(7), Below(7), 1 + Below(6), 1 + Below(6)}, kColors[Below(5)],
                            true);
         }
     }
@@ -175,7 +167,7 @@ private:
     void TakeHostsTurn() {
         EndTurn();
         glBindFramebuffer(GL_READ_FRAMEBUFFER, 0);
-        glBindFramebuffer(GL_DRAW_FRAMEBUFFER, mHost->GetName());
+        glBindFramebuffer(GL_DRAW_FRAMEBUFFER, mHost.GetName());
         glDisable(GL_RASTERIZER_DISCARD);
         glColorMask(1, 1, 1, 1);
         Box const box{Below(7), Below(7), 2, 2};
@@ -218,7 +210,8 @@ private:
         mHostsState = ReadHostsState();
     }
     static std::vector<GLint> ReadHostsState() {
-        std::vector<GLint> state = GetViewport();
+        std::vector<GLint> state(4);
+        glGetIntegerv(GL_VIEWPORT, state.data());
         for (int const name : {GL_DRAW_FRAMEBUFFER_BINDING, GL_READ_FRAMEBUFFER_BINDING,
                                GL_VERTEX_ARRAY_BINDING, GL_ARRAY_BUFFER_BINDING, GL_UNIFORM_BUFFER_BINDING,
                                GL_CULL_FACE, GL_RASTERIZER_DISCARD, GL_ACTIVE_TEXTURE}) {
@@ -393,8 +386,8 @@ private:
     StencilComparison mComparison = StencilAlways;
     StencilOperation mPass = StencilKeep;
 
-    std::unique_ptr<HostFrameBuffer> mHost;
-    Picture mHostModel;
+    HostFrameBuffer const mHost{kSize, kSize};
+    Picture mHostModel = Filled(kUntouched);
     GLuint mHostsArray = 0;
     GLuint mHostsBuffer = 0;
     std::vector<GLint> mHostsState; // empty until the host had its first turn

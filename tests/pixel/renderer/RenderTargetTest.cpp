@@ -118,15 +118,14 @@ TEST_F(RenderTargetTest, ADriverErrorIsLoggedCountedAndHarmless) {
     Picture image = MakeImage(4, 4);
     target->ReadPixels(0, 0, 4, 4, {image.pixels.data(), 4, 0, 0});
     EXPECT_EQ(image, MakeImage(4, 4));
-    EXPECT_GE(RendererFactory::GetStatistics().errors, 1u);
+    EXPECT_GE(Count().errors, 1u);
     EXPECT_GE(TakeErrors().size(), 1u);
     ForgetDriverErrors();
     glDeleteFramebuffers(1, &incomplete);
 }
 
 TEST_F(RenderTargetTest, ATargetWithoutAlphaIsCopiedWithAlphaOne) {
-    HostFrameBuffer const host(5, 4, GL_RGB8);
-    host.Fill(Color{10, 20, 30, 40});
+    HostFrameBuffer const host(5, 4, GL_RGB8, Color{10, 20, 30, 40});
     TargetPtr const target(RendererFactory::CreateRenderTargetFromCurrent(5, 4));
     glEnable(GL_SCISSOR_TEST);
     glScissor(0, 0, 1, 1);
@@ -170,13 +169,13 @@ TEST_F(RenderTargetTest, WhatDoesNotFitIsRefusedWithALine) {
     hosts.target->AttachDepthStencil(fitting.get());
     EXPECT_EQ(GetAttachment(hosts), 0);
     hosts.target->ClearDepthStencil(true, 1, true, 1);
-    EXPECT_EQ(RendererFactory::GetStatistics().clears, 0u);
+    EXPECT_EQ(Count().clears, 0u);
     EXPECT_FALSE(RendererFactory::CreateDepthStencilBuffer(0, 4));
     EXPECT_EQ(TakeErrors().size(), 3u);
 }
 
 TEST_F(RenderTargetTest, ABufferThatGoesIsKeptForTheNextOfItsSizeAndOnlyTheLastFewAre) {
-    auto const countKept = [] { return RendererFactory::GetStatistics().pooledRenderBuffers; };
+    auto const countKept = [] { return Count().pooledRenderBuffers; };
     MakeDepthStencil(4, 4);
     EXPECT_EQ(countKept(), 1);
     DepthStencilPtr const other = MakeDepthStencil(4, 3);

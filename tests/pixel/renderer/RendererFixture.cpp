@@ -16,18 +16,22 @@ Picture MakeImage(int width, int height, Color const& fill) {
 
 Picture MakePattern(int width, int height) {
     Picture image(width, height);
-    for (int y = 0; y < height; ++y) {
-        for (int x = 0; x < width; ++x) {
-            auto const high = static_cast<std::uint8_t>((x >> 8) * 16 + (y >> 8));
-            image.SetColor(x, y,
-                           {static_cast<std::uint8_t>(x), static_cast<std::uint8_t>(y), high,
-                            static_cast<std::uint8_t>(7 * x + 13 * y + 1)});
-        }
+    for (int i = 0; i < width * height; ++i) {
+        auto const x = static_cast<std::uint8_t>(i % width);
+        auto const y = static_cast<std::uint8_t>(i / width);
+        image.SetColor(x, y, {x, y, 0x5A, static_cast<std::uint8_t>(7 * x + 13 * y + 1)});
     }
     return image;
 }
 
-HostFrameBuffer::HostFrameBuffer(int width, int height, GLenum format) : mWidth(width), mHeight(height) {
+std::array<float, 4> ToFloats(Color const& color) {
+    std::array<float, 4> floats{};
+    for (std::size_t i = 0; i < 4; ++i) floats[i] = static_cast<float>(color[i]) / 255;
+    return floats;
+}
+
+HostFrameBuffer::HostFrameBuffer(int width, int height, GLenum format, Color const& fill)
+    : mWidth(width), mHeight(height) {
     glGenRenderbuffers(1, &mColor);
     glBindRenderbuffer(GL_RENDERBUFFER, mColor);
     glRenderbufferStorage(GL_RENDERBUFFER, format, width, height);
@@ -35,19 +39,12 @@ HostFrameBuffer::HostFrameBuffer(int width, int height, GLenum format) : mWidth(
     glBindFramebuffer(GL_FRAMEBUFFER, mName);
     glFramebufferRenderbuffer(GL_FRAMEBUFFER, GL_COLOR_ATTACHMENT0, GL_RENDERBUFFER, mColor);
     EXPECT_EQ(glCheckFramebufferStatus(GL_FRAMEBUFFER), GLenum{GL_FRAMEBUFFER_COMPLETE});
-    Fill(kUntouched);
+    glClearBufferfv(GL_COLOR, 0, ToFloats(fill).data());
 }
 
 HostFrameBuffer::~HostFrameBuffer() {
     glDeleteFramebuffers(1, &mName);
     glDeleteRenderbuffers(1, &mColor);
-}
-
-void HostFrameBuffer::Fill(Color color) const {
-    glBindFramebuffer(GL_FRAMEBUFFER, mName);
-    GLfloat const value[4] = {static_cast<float>(color[0]) / 255, static_cast<float>(color[1]) / 255,
-                              static_cast<float>(color[2]) / 255, static_cast<float>(color[3]) / 255};
-    glClearBufferfv(GL_COLOR, 0, value);
 }
 
 Picture HostFrameBuffer::Read() const {
@@ -61,56 +58,36 @@ RendererFixture::RendererFixture() {
     SetLogSink([this](LogLine const& line) {
         if (line.priority >= ANDROID_LOG_ERROR) mErrors.push_back(line.text);
     });
-}
-
-RendererFixture::~RendererFixture() { SetLogSink(nullptr); }
-
-namespace {
-
-// Holds the display open for the life of the process. A driver is unloaded with its last display, and what
-// it had not freed is then reported as leaked without a stack that tells whose it was.
-void KeepDriverLoaded(std::string* error) {
-    // Stored for real, so that the leak checker finds it.
-    [[gnu::used]] static detail::EglContext const* kept = detail::EglContext::Open({}, error).release();
-}
-
-} // namespace
-
-void RendererFixture::SetUp() {
+    // Holds the display open for the life of the process. A driver is unloaded with its last display, and what
+    // it had not freed is then reported as leaked without a stack that tells whose it was. Stored for real, so
+    // that the leak checker finds it.
     std::string error;
-    KeepDriverLoaded(&error);
-    mEgl = detail::EglContext::Open({true, kSurfaceWidth, kSurfaceHeight}, &error);
-    ASSERT_TRUE(mEgl) << error;
-    ASSERT_TRUE(Attach());
+    [[gnu::used]] static detail::EglContext const* kept = detail::EglContext::Open({}, &error).release();
+    StartEgl();
+    EXPECT_TRUE(Attach());
 }
 
-void RendererFixture::TearDown() {
-    if (!mEgl) return;
+RendererFixture::~RendererFixture() {
     ExpectNothingLeft(RendererFactory::GetStatistics(), 0, mKnownDriverErrors);
     RendererFactory::DetachContext();
     RendererStatistics const after = RendererFactory::GetStatistics();
     EXPECT_EQ(after.pooledRenderBuffers + after.buffers, 0);
     EXPECT_EQ(glGetError(), GLenum{GL_NO_ERROR});
     EXPECT_EQ(TakeErrors(), std::vector<std::string>{});
+    SetLogSink(nullptr);
 }
 
 bool RendererFixture::Attach(RendererLimits const& limits) {
     return RendererFactory::AttachContext(limits, eglGetProcAddress);
 }
 
-TexturePtr RendererFixture::MakeTexture(int width, int height) {
+TexturePtr RendererFixture::MakeTexture(int width, int height, PixelSource const& source) {
     TextureDescriptor const descriptor(width, height, 0, 2, 6, 1, false, nullptr);
-    return TexturePtr(RendererFactory::CreateTextureObject(descriptor, nullptr, 0, {}));
-}
-
-TexturePtr RendererFixture::MakeTexture(Picture const& image) {
-    TextureDescriptor const descriptor(image.width, image.height, 0, 2, 6, 1, false, nullptr);
-    PixelSource const source{image.pixels.data(), 0, 0, image.width};
     return TexturePtr(RendererFactory::CreateTextureObject(descriptor, nullptr, 0, source));
 }
 
-TexturePtr RendererFixture::MakeView(ITextureObject const& model) {
-    return TexturePtr(RendererFactory::CreateTextureObject(TextureDescriptor(&model), nullptr, 0, {}));
+TexturePtr RendererFixture::MakeTexture(Picture const& image) {
+    return MakeTexture(image.width, image.height, {image.pixels.data(), 0, 0, image.width});
 }
 
 TargetPtr RendererFixture::MakeTarget(ITextureObject& texture) {
@@ -138,15 +115,15 @@ Picture RendererFixture::Read(ITextureObject& texture) {
 }
 
 void RendererFixture::Clear(IRenderTarget& target, Color color) {
-    target.ClearColor(static_cast<float>(color[0]) / 255, static_cast<float>(color[1]) / 255,
-                      static_cast<float>(color[2]) / 255, static_cast<float>(color[3]) / 255);
+    auto const [r, g, b, a] = ToFloats(color);
+    target.ClearColor(r, g, b, a);
 }
 
 std::vector<std::string> RendererFixture::TakeErrors() { return std::exchange(mErrors, {}); }
 
 void RendererFixture::ForgetDriverErrors() { mKnownDriverErrors = RendererFactory::GetStatistics().errors; }
 
-void RendererFixture::RestartEgl() {
+void RendererFixture::StartEgl() {
     mEgl.reset();
     std::string error;
     mEgl = detail::EglContext::Open({true, kSurfaceWidth, kSurfaceHeight}, &error);
@@ -169,12 +146,6 @@ GLint GetInteger(GLenum name) {
     GLint value = 0;
     glGetIntegerv(name, &value);
     return value;
-}
-
-std::vector<GLint> GetViewport() {
-    std::vector<GLint> viewport(4);
-    glGetIntegerv(GL_VIEWPORT, viewport.data());
-    return viewport;
 }
 
 } // namespace Moka::Testing

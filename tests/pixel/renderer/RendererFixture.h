@@ -36,6 +36,8 @@ constexpr GLuint kLastName = 0xFFFFFFFE;
 Picture MakeImage(int width, int height, Color const& fill = kUntouched);
 // Every pixel different from every other.
 Picture MakePattern(int width, int height);
+// Components from 0 to 1.
+std::array<float, 4> ToFloats(Color const& color);
 
 struct Releaser {
     template <class T>
@@ -56,13 +58,12 @@ struct OffscreenImage {
 // A frame buffer as a host makes it, with raw GL, bound when made.
 class HostFrameBuffer {
 public:
-    HostFrameBuffer(int width, int height, GLenum format = GL_RGBA8);
+    HostFrameBuffer(int width, int height, GLenum format = GL_RGBA8, Color const& fill = kUntouched);
     ~HostFrameBuffer();
     HostFrameBuffer(HostFrameBuffer const&) = delete;
     HostFrameBuffer& operator=(HostFrameBuffer const&) = delete;
 
     GLuint GetName() const { return mName; }
-    void Fill(Color color) const;
     Picture Read() const;
 
 private:
@@ -75,15 +76,13 @@ private:
 class RendererFixture : public ::testing::Test {
 protected:
     RendererFixture();
+    // Looks at what is left, when the members of the fixtures that derive from it are gone.
     ~RendererFixture() override;
-    void SetUp() override;
-    void TearDown() override;
 
     static bool Attach(RendererLimits const& limits = {});
 
-    static TexturePtr MakeTexture(int width, int height);
+    static TexturePtr MakeTexture(int width, int height, PixelSource const& source = {});
     static TexturePtr MakeTexture(Picture const& image);
-    static TexturePtr MakeView(ITextureObject const& model);
     static TargetPtr MakeTarget(ITextureObject& texture);
     static OffscreenImage MakeOffscreen(Picture const& image);
     static DepthStencilPtr MakeDepthStencil(int width, int height);
@@ -94,14 +93,15 @@ protected:
 
     // The error lines since the last call; one that nobody takes fails the test.
     std::vector<std::string> TakeErrors();
+    static RendererStatistics Count() { return RendererFactory::GetStatistics(); }
     // For tests that make the driver complain on purpose.
     void ForgetDriverErrors();
 
     // The default frame buffer.
     static constexpr int kSurfaceWidth = 64;
     static constexpr int kSurfaceHeight = 48;
-    // Ends the context and begins another one.
-    void RestartEgl();
+    // Ends the context, if there is one, and begins another one.
+    void StartEgl();
 
 private:
     std::unique_ptr<detail::EglContext> mEgl;
@@ -119,7 +119,6 @@ struct RawAttribute {
 void DrawRawStrip(std::initializer_list<RawAttribute> attributes);
 
 GLint GetInteger(GLenum name);
-std::vector<GLint> GetViewport();
 
 // For tests with deferral and without.
 inline std::string GetDrawMode(::testing::TestParamInfo<bool> const& mode) {

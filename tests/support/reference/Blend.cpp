@@ -13,53 +13,47 @@ Rgba Mix(Rgba const& s, double ks, Rgba const& d, double kd, double alpha) {
     return {s.r * ks + d.r * kd, s.g * ks + d.g * kd, s.b * ks + d.b * kd, alpha};
 }
 
+Rgba TakeSource(Rgba const& s, Rgba const&) { return s; }
+
 Rgba Unpremultiplied(Rgba const& c) {
     if (c.a == 0) return {};
     return {c.r / c.a, c.g / c.a, c.b / c.a, c.a};
 }
 
-Rgba BlendUnclamped(int mode, Rgba const& s, Rgba const& d) {
-    switch (mode) {
-    case MKPaint::Add:
-        return Mix(s, 1, d, 1, s.a + d.a);
-    case MKPaint::Clear:
-        return {};
-    case MKPaint::Dst:
-        return d;
-    case MKPaint::DstAtop:
-        return Mix(s, 1 - d.a, d, s.a, s.a);
-    case MKPaint::DstIn:
-        return Mix(s, 0, d, s.a, d.a * s.a);
-    case MKPaint::DstOut:
-        return Mix(s, 0, d, 1 - s.a, d.a * (1 - s.a));
+// The modes that are none of these draw as SrcOver, also unknown numbers.
+constexpr struct {
+    int mode;
+    Rgba (*blend)(Rgba const& s, Rgba const& d);
+} kModes[] = {
+    {MKPaint::Add, [](Rgba const& s, Rgba const& d) { return Mix(s, 1, d, 1, s.a + d.a); }},
+    {MKPaint::Clear, [](Rgba const&, Rgba const&) { return Rgba(); }},
+    {MKPaint::Dst, [](Rgba const&, Rgba const& d) { return d; }},
+    {MKPaint::DstAtop, [](Rgba const& s, Rgba const& d) { return Mix(s, 1 - d.a, d, s.a, s.a); }},
+    {MKPaint::DstIn, [](Rgba const& s, Rgba const& d) { return Mix(s, 0, d, s.a, d.a * s.a); }},
+    {MKPaint::DstOut, [](Rgba const& s, Rgba const& d) { return Mix(s, 0, d, 1 - s.a, d.a * (1 - s.a)); }},
     // Not symmetric to SrcOver: the source's alpha is weighed by itself.
-    case MKPaint::DstOver:
-        return Mix(s, 1 - d.a, d, 1, s.a * (1 - s.a) + d.a);
-    case MKPaint::Modulate:
-        return {s.r * d.r, s.g * d.g, s.b * d.b, s.a * d.a};
-    case MKPaint::Src:
-    case MKPaint::Darken:
-    case MKPaint::Lighten:
-    case MKPaint::BlendingOff:
-        return s;
-    case MKPaint::SrcAtop:
-        return Mix(s, d.a, d, 1 - s.a, d.a);
-    case MKPaint::SrcIn:
-        return Mix(s, d.a, d, 0, s.a * d.a);
-    case MKPaint::SrcOut:
-        return Mix(s, 1 - d.a, d, 0, s.a * (1 - d.a));
-    case MKPaint::SrcKeepDstAlpha:
-        return Mix(s, 1, d, 0, d.a);
-    case MKPaint::SrcNonPremultiplied:
-        return Mix(s, s.a, d, 0, s.a);
-    case MKPaint::SrcOverNonPremultiplied:
-        return Mix(s, s.a, d, 1 - s.a, s.a + d.a * (1 - s.a));
-    default:
-        return Mix(s, 1, d, 1 - s.a, s.a + d.a * (1 - s.a)); // SrcOver, also for unknown numbers
-    }
-}
+    {MKPaint::DstOver,
+     [](Rgba const& s, Rgba const& d) { return Mix(s, 1 - d.a, d, 1, s.a * (1 - s.a) + d.a); }},
+    {MKPaint::Modulate,
+     [](Rgba const& s, Rgba const& d) { return Rgba(s.r * d.r, s.g * d.g, s.b * d.b, s.a * d.a); }},
+    {MKPaint::Src, TakeSource},
+    {MKPaint::Darken, TakeSource},
+    {MKPaint::Lighten, TakeSource},
+    {MKPaint::BlendingOff, TakeSource},
+    {MKPaint::SrcAtop, [](Rgba const& s, Rgba const& d) { return Mix(s, d.a, d, 1 - s.a, d.a); }},
+    {MKPaint::SrcIn, [](Rgba const& s, Rgba const& d) { return Mix(s, d.a, d, 0, s.a * d.a); }},
+    {MKPaint::SrcOut, [](Rgba const& s, Rgba const& d) { return Mix(s, 1 - d.a, d, 0, s.a * (1 - d.a)); }},
+    {MKPaint::SrcKeepDstAlpha, [](Rgba const& s, Rgba const& d) { return Mix(s, 1, d, 0, d.a); }},
+    {MKPaint::SrcNonPremultiplied, [](Rgba const& s, Rgba const& d) { return Mix(s, s.a, d, 0, s.a); }},
+    {MKPaint::SrcOverNonPremultiplied,
+     [](Rgba const& s, Rgba const& d) { return Mix(s, s.a, d, 1 - s.a, s.a + d.a * (1 - s.a)); }},
+};
 
 } // namespace
+
+double Distance(Rgba const& a, Rgba const& b) {
+    return std::max({std::abs(a.r - b.r), std::abs(a.g - b.g), std::abs(a.b - b.b), std::abs(a.a - b.a)});
+}
 
 Rgba FromBytes(Color const& c) { return {c[0] / 255.0, c[1] / 255.0, c[2] / 255.0, c[3] / 255.0}; }
 
@@ -83,7 +77,11 @@ Rgba PaintColor(MKPaint const& paint, double coverage) {
 }
 
 Rgba Blend(int mode, Rgba const& source, Rgba const& destination) {
-    return Clamped(BlendUnclamped(mode, Clamped(source), destination));
+    Rgba const s = Clamped(source);
+    for (auto const& known : kModes) {
+        if (known.mode == mode) return Clamped(known.blend(s, destination));
+    }
+    return Clamped(Mix(s, 1, destination, 1 - s.a, s.a + destination.a * (1 - s.a)));
 }
 
 Rgba DarkenOrLighten(bool darken, Rgba const& source, Rgba const& destination) {

@@ -17,6 +17,7 @@ struct Rgba {
     double a = 0;
 };
 
+double Distance(Rgba const& a, Rgba const& b); // in the channel that differs most
 Rgba FromBytes(Color const& color);
 Color ToBytes(Rgba const& color); // clamped, to the nearest
 Rgba RoundedToBytes(Rgba const& color);

@@ -1,5 +1,7 @@
 #include "tests/support/reference/ClipSet.h"
 
+#include "tests/support/reference/Coverage.h"
+
 #include <algorithm>
 
 namespace Moka::Testing {
@@ -54,40 +56,28 @@ ClipSet::ClipSet(std::vector<ClipEntry> const& entries, int targetHeight) {
     if (entries.empty()) return;
     auto const last = std::find_if(entries.rbegin(), entries.rend(), IsReplace);
     mStartsFull = last == entries.rend();
-    std::size_t const from = mStartsFull ? 0 : static_cast<std::size_t>(entries.rend() - last) - 1;
-    if (ArePixelsEnough(entries)) {
-        mKind = Kind::Pixels;
-        CutPixels(entries, from, targetHeight);
-        return;
-    }
-    mKind = Kind::Points;
-    for (std::size_t i = from; i < entries.size(); ++i) {
-        ClipEntry const& e = entries[i];
-        auto const x = static_cast<float>(e.x);
-        auto const y = static_cast<float>(e.y);
-        RectF const r(
-            std::min(x, x + static_cast<float>(e.width)), std::min(y, y + static_cast<float>(e.height)),
-            std::max(x, x + static_cast<float>(e.width)), std::max(y, y + static_cast<float>(e.height)));
-        mRegions.push_back({e.op, r, Transform(e.matrix)});
-    }
-}
-
-void ClipSet::CutPixels(std::vector<ClipEntry> const& entries, std::size_t from, int targetHeight) {
-    mPixels = ToPixels(entries[from], targetHeight);
-    for (std::size_t i = from + 1; i < entries.size(); ++i) {
-        Rect const r = ToPixels(entries[i], targetHeight);
-        mPixels = Rect(std::max(mPixels.left, r.left), std::max(mPixels.top, r.top),
-                       std::min(mPixels.right, r.right), std::min(mPixels.bottom, r.bottom));
+    bool const areStraight = ArePixelsEnough(entries);
+    for (auto e = mStartsFull ? entries.begin() : last.base() - 1; e != entries.end(); ++e) {
+        if (areStraight) {
+            Rect const r = ToPixels(*e, targetHeight);
+            Rect const& all = mPixels.value_or(r);
+            mPixels = Rect(std::max(all.left, r.left), std::max(all.top, r.top), std::min(all.right, r.right),
+                           std::min(all.bottom, r.bottom));
+        } else {
+            auto const x = static_cast<float>(e->x);
+            auto const y = static_cast<float>(e->y);
+            RectF const box(x, y, x + static_cast<float>(e->width), y + static_cast<float>(e->height));
+            mRegions.push_back({e->op, RectD(Sorted(box)), Transform(e->matrix)});
+        }
     }
 }
 
 bool ClipSet::Contains(int pixelX, int pixelY, PointD const& point) const {
-    if (mKind == Kind::Everything) return true;
-    if (mKind == Kind::Pixels) return mPixels.Contains(Point(pixelX, pixelY));
+    if (mPixels) return mPixels->Contains(Point(pixelX, pixelY));
     bool area = mStartsFull;
     for (Region const& region : mRegions) {
         auto const local = region.transform.Unmap(point);
-        area = Combine(region.op, area, local && RectD(region.rect).Holds(*local));
+        area = Combine(region.op, area, local && region.rect.Holds(*local));
     }
     return area;
 }

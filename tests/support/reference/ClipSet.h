@@ -18,25 +18,22 @@ struct ClipEntry {
 
 class ClipSet {
 public:
+    ClipSet() = default; // everything
     ClipSet(std::vector<ClipEntry> const& entries, int targetHeight);
 
-    bool IsPointSet() const { return mKind == Kind::Points; }
+    bool IsPointSet() const { return !mRegions.empty(); }
     // The pixel for straight clips, the point in target pixels for the others.
     bool Contains(int pixelX, int pixelY, PointD const& point) const;
 
 private:
-    enum class Kind { Everything, Pixels, Points };
     struct Region {
         IMKCanvasBase::ClipOp op;
-        RectF rect;
+        RectD rect;
         Transform transform;
     };
 
-    void CutPixels(std::vector<ClipEntry> const& entries, std::size_t from, int targetHeight);
-
-    Kind mKind = Kind::Everything;
-    Rect mPixels;
-    bool mStartsFull = false;
+    std::optional<Rect> mPixels; // of straight clips
+    bool mStartsFull = true;
     std::vector<Region> mRegions;
 };
 

@@ -38,8 +38,7 @@ struct Axis {
         : from(begin),
           length(std::hypot(to.x - from.x, to.y - from.y)),
           d((to.x - from.x) / length, (to.y - from.y) / length),
-          box(Sorted(RectF(static_cast<float>(from.x), static_cast<float>(from.y), static_cast<float>(to.x),
-                           static_cast<float>(to.y)))) {}
+          box(Box(from.x, from.y, to.x, to.y)) {}
 
     double Along(PointD const& p) const { return (p.x - from.x) * d.x + (p.y - from.y) * d.y; }
     double Across(PointD const& p) const { return (p.y - from.y) * d.x - (p.x - from.x) * d.y; }
@@ -76,7 +75,6 @@ struct LineGeometry {
     Interval FindSolid(double x) const;
     Interval FindDashed(double x) const;
     double CoverAlong(double x, double across) const;
-    double CoverAcross(double across) const;
     // Whether the length comes so near to a boundary of the pattern that single precision may find it on
     // either side.
     bool IsEndOpen() const;
@@ -122,11 +120,10 @@ double LineGeometry::CoverAlong(double x, double across) const {
     return Clamp01(0.5 + std::max(i.left + halfWidth - i.x, i.x - i.right + halfWidth));
 }
 
-// A line thinner than its two ramps is not covered whole even on its axis.
-double LineGeometry::CoverAcross(double across) const {
+// One thinner than its two ramps is not covered whole even on its axis, and has a step between them.
+double CoverAcross(double halfWidth, double across) {
     if (across > halfWidth - 0.5) return Clamp01(0.5 + halfWidth - across);
-    if (across < -halfWidth + 0.5) return Clamp01(0.5 + halfWidth + across);
-    return 1;
+    return Clamp01(0.5 + halfWidth + across);
 }
 
 bool LineGeometry::IsEndOpen() const {
@@ -168,6 +165,11 @@ RectF Sorted(RectF const& r) {
             std::max(r.top, r.bottom)};
 }
 
+RectF Box(double left, double top, double right, double bottom) {
+    return Sorted({static_cast<float>(left), static_cast<float>(top), static_cast<float>(right),
+                   static_cast<float>(bottom)});
+}
+
 Shape FilledRect(RectF const& rect, bool antiAliased) {
     RectF const r = Sorted(rect);
     if (!antiAliased) {
@@ -195,25 +197,21 @@ Shape StrokedRect(RectF const& rect, double width, bool antiAliased) {
 }
 
 Shape FilledCircle(PointD const& center, double radius) {
-    RectF const point(static_cast<float>(center.x), static_cast<float>(center.y),
-                      static_cast<float>(center.x), static_cast<float>(center.y));
-    return {Grown(point, radius + 0.5), [=](PointD const& p) -> Coverage {
+    return {Grown(Box(center.x, center.y, center.x, center.y), radius + 0.5),
+            [=](PointD const& p) -> Coverage {
                 double const outside = std::hypot(p.x - center.x, p.y - center.y) - radius;
                 if (outside > 0.5) return {};
                 return Fragment{std::min(1.0, 0.5 - outside)};
             }};
 }
 
-// The outer ramp comes first: a stroke thinner than the ramps has a step between them.
 Shape StrokedCircle(PointD const& center, double radius, double width) {
     double const k = width / 2;
     RectF const bounds = Grown(FilledCircle(center, radius).bounds, k + 1);
     return {bounds, [=](PointD const& p) -> Coverage {
                 double const outside = std::hypot(p.x - center.x, p.y - center.y) - radius;
-                if (outside > k + 0.5 || outside < -k - 0.5) return {};
-                if (outside > k - 0.5) return Fragment{k + 0.5 - outside};
-                if (outside < -k + 0.5) return Fragment{outside + k + 0.5};
-                return Fragment{1};
+                if (std::abs(outside) > k + 0.5) return {};
+                return Fragment{CoverAcross(k, outside)};
             }};
 }
 
@@ -239,7 +237,7 @@ Shape Line(PointD const& from, PointD const& to, MKPaint const& paint) {
                 double const across = axis.Across(p);
                 if (!(along >= -reach && along <= axis.length + reach && std::abs(across) <= reach))
                     return {};
-                return Fragment{std::min(line.CoverAlong(along, across), line.CoverAcross(across)),
+                return Fragment{std::min(line.CoverAlong(along, across), CoverAcross(line.halfWidth, across)),
                                 endIsOpen && along > axis.length - reach};
             }};
 }

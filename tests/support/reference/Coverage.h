@@ -2,12 +2,10 @@
 // edges and ramps one unit wide across them, in the units the shape is given in.
 #pragma once
 
-#include "moka/base/Rect.h"
 #include "moka/graphics/canvas/MKPaint.h"
 #include "tests/support/reference/Plane.h"
 
 #include <functional>
-#include <optional>
 #include <vector>
 
 namespace Moka::Testing {
@@ -30,6 +28,7 @@ struct Shape {
 double InsetIn(RectF const& r, PointD const& p);
 RectF Grown(RectF const& r, double by);
 RectF Sorted(RectF const& r);
+RectF Box(double left, double top, double right, double bottom); // sorted
 
 Shape FilledRect(RectF const& r, bool antiAliased);
 Shape StrokedRect(RectF const& r, double width, bool antiAliased);

@@ -9,7 +9,7 @@
 
 namespace Moka::Testing {
 
-class ReferenceBitmap final : public MKBitmap {
+class ReferenceBitmap : public MKBitmap {
 public:
     explicit ReferenceBitmap(Picture const& pixels)
         : MKBitmap(nullptr, 0, 0, pixels.width, pixels.height), image(pixels) {}

@@ -1,7 +1,6 @@
 // The canvas's state, and its shapes; ReferenceCanvasBitmaps.cpp draws the bitmaps.
 #include "tests/support/reference/ReferenceCanvas.h"
 
-#include <algorithm>
 #include <cmath>
 
 namespace Moka::Testing {
@@ -96,8 +95,7 @@ void ReferenceCanvas::DrawRect(RectF const& rect, MKPaint const* given) {
     std::vector<Shape> shapes;
     if (Fills(paint)) shapes.push_back(FilledRect(rect, paint.IsAntiAliasing()));
     if (Strokes(paint) && paint.GetLineWidth() >= 1) {
-        shapes.push_back(
-            StrokedRect(rect, static_cast<double>(paint.GetLineWidth()), paint.IsAntiAliasing()));
+        shapes.push_back(StrokedRect(rect, double{paint.GetLineWidth()}, paint.IsAntiAliasing()));
     }
     DrawShapes(shapes, rect, paint);
 }
@@ -106,24 +104,23 @@ void ReferenceCanvas::DrawRoundRect(RectF const& rect, float rx, float ry, MKPai
     if (!(rx > 0 && ry > 0)) return DrawRect(rect, given);
     MKPaint const paint = Given(given);
     if (IsFlat(rect)) return;
-    auto const x = static_cast<double>(rx);
-    auto const y = static_cast<double>(ry);
+    auto const x = double{rx};
+    auto const y = double{ry};
     if (Fills(paint)) DrawShapes(FilledRoundRect(rect, x, y), rect, paint, true);
     if (Strokes(paint) && paint.GetLineWidth() >= 1) {
-        DrawShapes(StrokedRoundRect(rect, x, y, static_cast<double>(paint.GetLineWidth())), rect, paint,
-                   true);
+        DrawShapes(StrokedRoundRect(rect, x, y, double{paint.GetLineWidth()}), rect, paint, true);
     }
 }
 
 void ReferenceCanvas::DrawCircle(float cx, float cy, float radius, MKPaint const* given) {
     MKPaint const paint = Given(given);
     if (!(radius > 0)) return;
-    PointD const center{static_cast<double>(cx), static_cast<double>(cy)};
-    auto const r = static_cast<double>(radius);
+    PointD const center{double{cx}, double{cy}};
+    auto const r = double{radius};
     std::vector<Shape> shapes;
     if (Fills(paint)) shapes.push_back(FilledCircle(center, r));
     if (Strokes(paint) && paint.GetLineWidth() > 0) {
-        shapes.push_back(StrokedCircle(center, r, static_cast<double>(paint.GetLineWidth())));
+        shapes.push_back(StrokedCircle(center, r, double{paint.GetLineWidth()}));
     }
     RectF extent(cx, cy, cx, cy);
     extent.IncreaseRect(radius, radius);

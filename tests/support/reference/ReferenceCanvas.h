@@ -9,9 +9,6 @@
 #include "tests/support/reference/ReferenceBitmap.h"
 #include "tests/support/reference/ReferenceRaster.h"
 
-#include <string>
-#include <vector>
-
 namespace Moka::Testing {
 
 class ReferenceCanvas final : public IMKCanvas, public RefCount {
@@ -27,8 +24,8 @@ public:
 
     void Clear(int argb) override { mRaster.Fill(Unpack(argb), GetClip()); }
     void Clear(float r, float g, float b, float a) override { mRaster.Fill({r, g, b, a}, GetClip()); }
-    void ClearAll(int argb) override { mRaster.FillAll(Unpack(argb)); }
-    void ClearAll(float r, float g, float b, float a) override { mRaster.FillAll({r, g, b, a}); }
+    void ClearAll(int argb) override { mRaster.Fill(Unpack(argb), {}); }
+    void ClearAll(float r, float g, float b, float a) override { mRaster.Fill({r, g, b, a}, {}); }
 
     int Save(SaveFlag flag) override;
     void Restore(int level) override;

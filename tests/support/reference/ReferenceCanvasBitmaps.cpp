@@ -1,6 +1,5 @@
 #include "tests/support/reference/ReferenceCanvas.h"
 
-#include <algorithm>
 #include <cmath>
 
 namespace Moka::Testing {
@@ -21,15 +20,10 @@ void SetTiling(Wrap& wrap, int mode) {
     if (mode == MKPaint::Repeat) wrap = Wrap::Repeat;
 }
 
-Rgba Times(Rgba const& c, double k) { return {c.r * k, c.g * k, c.b * k, c.a * k}; }
-
 Rgba Colored(Rgba const& texel, double coverage, MKPaint const& paint) {
-    double const a = coverage * static_cast<double>(paint.GetColor().w);
-    return paint.HasTintColor() ? PaintColor(paint, coverage * texel.a) : Times(texel, a);
-}
-
-double Distance(Rgba const& a, Rgba const& b) {
-    return std::max({std::abs(a.r - b.r), std::abs(a.g - b.g), std::abs(a.b - b.b), std::abs(a.a - b.a)});
+    if (paint.HasTintColor()) return PaintColor(paint, coverage * texel.a);
+    double const a = coverage * double{paint.GetColor().w};
+    return {texel.r * a, texel.g * a, texel.b * a, texel.a * a};
 }
 
 // The quad of an image whose texture covers bounds.
@@ -75,10 +69,6 @@ Brush MakeBrush(Picture const& image, Sampler const& sampler, BitmapQuad const& 
                 return ink;
             },
             blur};
-}
-
-bool Composes(MKPaint const& paint) {
-    return paint.GetXFermode() == MKPaint::Darken || paint.GetXFermode() == MKPaint::Lighten;
 }
 
 } // namespace
@@ -133,7 +123,7 @@ void ReferenceCanvas::DrawQuads(Picture const& image, ReferenceBitmap const& bit
     Painting painting;
     painting.matrix = mMatrix;
     painting.mode = paint.GetXFermode();
-    painting.composes = Composes(paint);
+    painting.composes = painting.mode == MKPaint::Darken || painting.mode == MKPaint::Lighten;
     painting.firstStripOnly = batch;
     if (!batch) painting.extent = quads[0].dst;
     for (BitmapQuad const& quad : quads) {
@@ -141,8 +131,7 @@ void ReferenceCanvas::DrawQuads(Picture const& image, ReferenceBitmap const& bit
     }
     ClipSet const clip = GetClip();
     // A batch draws where there is no stencil.
-    bool const unclipped = batch && clip.IsPointSet();
-    mRaster.Draw(painting, unclipped ? ClipSet({}, mTarget.image.height) : clip);
+    mRaster.Draw(painting, batch && clip.IsPointSet() ? ClipSet() : clip);
 }
 
 void ReferenceCanvas::DrawBitmaps(IMKBitmap* bitmap, std::vector<PointF>& points, MKPaint const* paint) {

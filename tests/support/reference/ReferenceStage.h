@@ -1,7 +1,6 @@
 // ReferenceStage: makes the bitmaps that a ReferenceCanvas draws. No queue: nothing of a GPU.
 #pragma once
 
-#include "scenes/Picture.h"
 #include "scenes/SceneStage.h"
 #include "tests/support/reference/ReferenceBitmap.h"
 

@@ -22,11 +22,6 @@ struct Frame {
     double innerLeft, innerTop, innerRight, innerBottom;
 };
 
-RectF MakeRect(double l, double t, double r, double b) {
-    return Sorted(
-        {static_cast<float>(l), static_cast<float>(t), static_cast<float>(r), static_cast<float>(b)});
-}
-
 // Half-open, so that of two pieces that meet exactly one has a point between them.
 template <class Function>
 Shape Piece(RectF const& bounds, Function const& coverage) {
@@ -40,13 +35,13 @@ Shape Piece(RectF const& bounds, Function const& coverage) {
 template <class Function>
 void AddSides(std::vector<Shape>& shapes, Frame const& f, double from, double to, Function const& profile) {
     RectD const r = f.outer;
-    shapes.push_back(Piece(MakeRect(f.innerLeft, r.top + from, f.innerRight, r.top + to),
+    shapes.push_back(Piece(Box(f.innerLeft, r.top + from, f.innerRight, r.top + to),
                            [=](PointD const& p) { return Fragment{profile(p.y - r.top)}; }));
-    shapes.push_back(Piece(MakeRect(f.innerLeft, r.bottom - to, f.innerRight, r.bottom - from),
+    shapes.push_back(Piece(Box(f.innerLeft, r.bottom - to, f.innerRight, r.bottom - from),
                            [=](PointD const& p) { return Fragment{profile(r.bottom - p.y)}; }));
-    shapes.push_back(Piece(MakeRect(r.left + from, f.innerTop, r.left + to, f.innerBottom),
+    shapes.push_back(Piece(Box(r.left + from, f.innerTop, r.left + to, f.innerBottom),
                            [=](PointD const& p) { return Fragment{profile(p.x - r.left)}; }));
-    shapes.push_back(Piece(MakeRect(r.right - to, f.innerTop, r.right - from, f.innerBottom),
+    shapes.push_back(Piece(Box(r.right - to, f.innerTop, r.right - from, f.innerBottom),
                            [=](PointD const& p) { return Fragment{profile(r.right - p.x)}; }));
 }
 
@@ -75,9 +70,8 @@ void AddCorners(std::vector<Shape>& shapes, Frame const& f, double k, bool fille
     for (bool const left : {true, false}) {
         for (bool const top : {true, false}) {
             PointD const center{left ? f.innerLeft : f.innerRight, top ? f.innerTop : f.innerBottom};
-            RectF const quad =
-                MakeRect(center.x, center.y, left ? f.outer.left - reach : f.outer.right + reach,
-                         top ? f.outer.top - reach : f.outer.bottom + reach);
+            RectF const quad = Box(center.x, center.y, left ? f.outer.left - reach : f.outer.right + reach,
+                                   top ? f.outer.top - reach : f.outer.bottom + reach);
             shapes.push_back(Piece(quad, [=](PointD const& p) {
                 return CoverCorner({p.x - center.x, p.y - center.y}, f.rx, f.ry, k, filled);
             }));
@@ -93,9 +87,9 @@ std::vector<Shape> FilledRoundRect(RectF const& r, double rx, double ry) {
     AddSides(shapes, f, -0.5, 0.5, [](double inset) { return inset + 0.5; });
     auto const solid = [](PointD const&) { return Fragment{1}; };
     auto const [l, t, right, b] = f.outer;
-    shapes.push_back(Piece(MakeRect(f.innerLeft, t + 0.5, f.innerRight, f.innerTop), solid));
-    shapes.push_back(Piece(MakeRect(l + 0.5, f.innerTop, right - 0.5, f.innerBottom), solid));
-    shapes.push_back(Piece(MakeRect(f.innerLeft, f.innerBottom, f.innerRight, b - 0.5), solid));
+    shapes.push_back(Piece(Box(f.innerLeft, t + 0.5, f.innerRight, f.innerTop), solid));
+    shapes.push_back(Piece(Box(l + 0.5, f.innerTop, right - 0.5, f.innerBottom), solid));
+    shapes.push_back(Piece(Box(f.innerLeft, f.innerBottom, f.innerRight, b - 0.5), solid));
     AddCorners(shapes, f, 0, true);
     return shapes;
 }

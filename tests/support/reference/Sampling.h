@@ -1,11 +1,8 @@
 // Sampling.h: the colour of an image at a texture coordinate, and the coordinate of a drawn bitmap's point.
 #pragma once
 
-#include "moka/graphics/canvas/MKPaint.h"
 #include "tests/support/reference/Blend.h"
 #include "tests/support/reference/Coverage.h"
-
-#include <array>
 
 namespace Moka::Testing {
 

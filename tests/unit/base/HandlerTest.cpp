@@ -1,11 +1,9 @@
 #include "moka/base/Handler.h"
 #include "moka/base/MessageLoop.h"
 
-#include "tests/support/Awaited.h"
 #include "tests/support/LogCapture.h"
 
 #include <gmock/gmock.h>
-#include <gtest/gtest.h>
 
 #include <atomic>
 #include <chrono>
@@ -13,7 +11,6 @@
 #include <memory>
 #include <optional>
 #include <thread>
-#include <vector>
 
 namespace Moka {
 namespace {
@@ -143,40 +140,15 @@ TEST_F(HandlerTest, QuitEndsTheRunningOrTheNextRun) {
     EXPECT_EQ(loop.RunPending(), 1) << "what it left can still run";
 }
 
-// A loop on a thread of its own, running until the object goes.
-class LoopThread {
-public:
-    explicit LoopThread(std::function<void()> setUp = nullptr) {
-        mThread = std::thread([this, setUp] {
-            MessageLoop loop;
-            if (setUp) setUp();
-            mLoop.Set(&loop); // cppcheck-suppress danglingLifetime ; not used after Run()
-            loop.Run();
-        });
-        mLoop.Await([](MessageLoop* loop) { return loop != nullptr; });
-    }
-    ~LoopThread() { Stop(); }
-    LoopThread(LoopThread const&) = delete;
-    LoopThread& operator=(LoopThread const&) = delete;
-
-    void Stop() {
-        if (!mThread.joinable()) return;
-        mLoop.Get()->Quit();
-        mThread.join();
-    }
-
-private:
-    Awaited<MessageLoop*> mLoop;
-    std::thread mThread;
-};
-
 TEST_F(HandlerTest, DestructionElsewhereWaitsForTheRunningMessage) {
     std::unique_ptr<Receiver> receiver;
     Awaited<bool> entered;
     std::atomic<bool> destroyed{false};
     bool finished = false; // not atomic: the destructor's waiting is what makes it visible
     bool refused = false;
-    LoopThread loop([&] {
+    Awaited<MessageLoop*> running;
+    std::thread thread([&] {
+        MessageLoop loop;
         receiver = std::make_unique<Receiver>([&](Handler* handler, int) {
             entered.Set(true);
             // Ends only when destruction has begun, which closes the handler.
@@ -186,14 +158,18 @@ TEST_F(HandlerTest, DestructionElsewhereWaitsForTheRunningMessage) {
             EXPECT_FALSE(destroyed);
             finished = true;
         });
+        running.Set(&loop); // cppcheck-suppress danglingLifetime ; not used after Run()
+        loop.Run();
     });
+    running.Await([](MessageLoop* loop) { return loop != nullptr; });
     (*receiver)->SendMessage(0);
     entered.AwaitAtLeast(true);
     receiver->DestroyHandler();
     destroyed = true;
     EXPECT_TRUE(finished);
     EXPECT_TRUE(refused);
-    loop.Stop();
+    running.Get()->Quit();
+    thread.join();
     EXPECT_THAT(receiver->GetReceived(), ElementsAre(0));
 }
 

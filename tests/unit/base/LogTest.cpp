@@ -6,7 +6,6 @@
 #include "moka/base/log/LogSink.h"
 
 #include <gmock/gmock.h>
-#include <gtest/gtest.h>
 
 #include <stdexcept>
 #include <string>

@@ -4,15 +4,12 @@
 #include "moka/base/CriticalSection.h"
 #include "moka/base/RefCount.h"
 
-#include "tests/support/Awaited.h"
 #include "tests/support/LogCapture.h"
 
 #include <gtest/gtest.h>
 
 #include <chrono>
-#include <string>
 #include <thread>
-#include <vector>
 
 #include <pthread.h>
 

@@ -1,13 +1,9 @@
 #include "tests/unit/codec/CodecTestSupport.h"
 
-#include "moka/base/Bitmap.h"
-#include "moka/base/String.h"
 #include "moka/base/codec/RowScaler.h"
 #include "moka/base/log/AndroidLog.h"
 
-#include <algorithm>
 #include <cmath>
-#include <gmock/gmock.h>
 #include <memory>
 #include <random>
 #include <turbojpeg.h>
@@ -147,6 +143,28 @@ Bytes Encode(Picture const& image, std::string const& extension, int quality) {
     std::string const path = folder.Path("image." + extension);
     EXPECT_TRUE(SaveImage(image, path, quality));
     return ReadBytes(path);
+}
+
+Bytes MakePlainJpeg(Bytes const& pixel, int format, int subsampling) {
+    Bytes pixels;
+    for (int i = 0; i < 256; ++i) pixels = std::move(pixels) + pixel;
+    return MakeJpeg(pixels, 16, 16, format, subsampling);
+}
+
+Bytes ToLittleEndian(std::uint64_t value, int count) {
+    Bytes bytes;
+    for (int i = 0; i < count; ++i) bytes.push_back(static_cast<unsigned char>(value >> (8 * i)));
+    return bytes;
+}
+
+Bytes ToBigEndian(std::uint64_t value, int count) {
+    Bytes const bytes = ToLittleEndian(value, count);
+    return Bytes(bytes.rbegin(), bytes.rend());
+}
+
+Bytes operator+(Bytes bytes, Bytes const& more) {
+    bytes.insert(bytes.end(), more.begin(), more.end());
+    return bytes;
 }
 
 Bytes Replace(Bytes bytes, std::size_t at, Bytes const& with) {

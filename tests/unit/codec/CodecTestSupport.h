@@ -1,16 +1,21 @@
 // CodecTestSupport.h: pictures, files and captured log lines for the tests of the image codecs.
 #pragma once
 
+#include "moka/base/Bitmap.h"
 #include "moka/base/BitmapFactory.h"
+#include "moka/base/String.h"
 #include "tests/support/ImageCompare.h"
 #include "tests/support/LogCapture.h"
 #include "tests/support/TestFiles.h"
 
 #include <cstdint>
-#include <string>
-#include <vector>
+#include <gmock/gmock.h>
 
 namespace Moka::Testing {
+
+using ::testing::AllOf;
+using ::testing::ElementsAre;
+using ::testing::HasSubstr;
 
 using Bytes = std::vector<unsigned char>;
 
@@ -45,12 +50,17 @@ Picture DecodeFile(std::string const& path);
 Picture DecodeScaled(std::string const& path, int width, int height);
 // Fails the test when the factory finds none.
 ImageInfo GetInfo(std::string const& path);
-// By libjpeg-turbo, of pixels in one of its formats.
+// By libjpeg-turbo, of pixels in one of its formats. The second has one colour.
 Bytes MakeJpeg(Bytes const& pixels, int width, int height, int format, int subsampling, int flags = 0);
+Bytes MakePlainJpeg(Bytes const& pixel, int format, int subsampling);
 // The file's bytes.
 Bytes Encode(Picture const& image, std::string const& extension, int quality = 100);
 
+Bytes ToLittleEndian(std::uint64_t value, int count);
+Bytes ToBigEndian(std::uint64_t value, int count);
+
 // Edits in a copy.
+Bytes operator+(Bytes bytes, Bytes const& more);
 Bytes Replace(Bytes bytes, std::size_t at, Bytes const& with);
 Bytes Insert(Bytes bytes, std::size_t at, Bytes const& what);
 std::size_t Find(Bytes const& bytes, Bytes const& what); // fails the test when it is not there

@@ -1,43 +1,22 @@
 // What files say of their colours, and of what else they hold besides pixels.
-#include "moka/base/Bitmap.h"
-#include "moka/base/String.h"
 #include "moka/base/log/AndroidLog.h"
 #include "tests/support/ColorProfiles.h"
-#include "tests/support/LogCapture.h"
 #include "tests/unit/codec/CodecTestSupport.h"
 
 #include <cmath>
 #include <functional>
-#include <gmock/gmock.h>
-#include <gtest/gtest.h>
 #include <memory>
 #include <turbojpeg.h>
 
 namespace Moka::Testing {
 namespace {
 
-using ::testing::ElementsAre;
-using ::testing::HasSubstr;
-
-// Grey, or of four inks, as the library writes it.
-Bytes MakePlainJpeg(Bytes const& pixel, int format, int subsampling) {
-    Bytes pixels;
-    for (int i = 0; i < 256; ++i) pixels.insert(pixels.end(), pixel.begin(), pixel.end());
-    return MakeJpeg(pixels, 16, 16, format, subsampling);
-}
-
-void AppendFixed(Bytes& bytes, double value) {
-    auto const scaled = static_cast<unsigned>(std::lround(value * 100000));
-    for (int shift = 24; shift >= 0; shift -= 8) bytes.push_back(static_cast<unsigned char>(scaled >> shift));
-}
-
 Bytes MakeNumbers(char const* type, std::vector<double> const& values) {
     Bytes content;
-    for (double const value : values) AppendFixed(content, value);
+    for (double const value : values)
+        content = content + ToBigEndian(static_cast<std::uint64_t>(std::lround(value * 100000)), 4);
     return MakePngChunk(type, content);
 }
-
-Bytes operator+(Bytes const& a, Bytes const& b) { return Insert(a, a.size(), b); }
 
 std::vector<double> const kAdobePrimaries{0.3127, 0.3290, 0.64, 0.33, 0.21, 0.71, 0.15, 0.06};
 
@@ -180,12 +159,9 @@ TEST(Metadata, OrientationIsToldAndNotApplied) {
 Bytes MakeFrame(Picture const& image, int x, int y) {
     Bytes const file = Encode(image, "webp");
     Bytes content;
-    for (int const value : {x / 2, y / 2, image.width - 1, image.height - 1, 100}) {
-        for (int shift = 0; shift < 24; shift += 8)
-            content.push_back(static_cast<unsigned char>(value >> shift));
-    }
-    content.push_back(0);
-    return MakeWebpChunk("ANMF", content + Bytes(file.begin() + 12, file.end()));
+    for (int const value : {x / 2, y / 2, image.width - 1, image.height - 1, 100})
+        content = content + ToLittleEndian(static_cast<std::uint64_t>(value), 3);
+    return MakeWebpChunk("ANMF", content + Bytes{0} + Bytes(file.begin() + 12, file.end()));
 }
 
 TEST(Animation, TheFirstFrameOfAWebpIsDecodedWhereItLies) {

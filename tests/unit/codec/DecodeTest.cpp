@@ -1,8 +1,6 @@
 #include "tests/unit/codec/CodecTestSupport.h"
 
 #include <cmath>
-#include <gmock/gmock.h>
-#include <gtest/gtest.h>
 #include <png.h>
 #include <random>
 #include <turbojpeg.h>
@@ -115,15 +113,6 @@ TEST(PngDecode, EveryColourTypeDepthAndInterlacingBecomesItsExactPixels) {
     }
 }
 
-using ::testing::ElementsAre;
-using ::testing::HasSubstr;
-
-Bytes Repeat(int count, Bytes const& pixel) {
-    Bytes pixels;
-    for (int i = 0; i < count; ++i) pixels.insert(pixels.end(), pixel.begin(), pixel.end());
-    return pixels;
-}
-
 // An application segment full of what looks like the end of an image.
 Bytes MakePreviewSegment() {
     Bytes segment = {0xFF, 0xE1, 0xFF, 0xFD};
@@ -140,8 +129,7 @@ TEST(JpegDecode, EveryColourSpaceAndCodingBecomesOpaqueRgb) {
             EXPECT_LE(LargestDifference(Decode(file), image), 12) << subsampling << ' ' << flags;
         }
     }
-    Picture const grey = Decode(MakeJpeg(Repeat(64, {77}), 8, 8, TJPF_GRAY, TJSAMP_GRAY));
-    EXPECT_EQ(grey.pixels, Repeat(64, {77, 77, 77, 255}));
+    EXPECT_EQ(Decode(MakePlainJpeg({77}, TJPF_GRAY, TJSAMP_GRAY)), Fill(16, 16, {77, 77, 77, 255}));
 }
 
 TEST(JpegDecode, FourInksMixToRgbByEitherConvention) {
@@ -150,9 +138,9 @@ TEST(JpegDecode, FourInksMixToRgbByEitherConvention) {
         return LargestDifference(Decode(file), Fill(16, 16, color)) <= 4;
     };
     // With Adobe's marker the numbers are light: 255 is no ink. The library codes them as YCCK.
-    Bytes const light = MakeJpeg(Repeat(256, {200, 100, 50, 255}), 16, 16, TJPF_CMYK, TJSAMP_444);
+    Bytes const light = MakePlainJpeg({200, 100, 50, 255}, TJPF_CMYK, TJSAMP_444);
     EXPECT_TRUE(isNear(light, {200, 100, 50, 255}));
-    Bytes dark = MakeJpeg(Repeat(256, {240, 240, 240, 128}), 16, 16, TJPF_CMYK, TJSAMP_420);
+    Bytes dark = MakePlainJpeg({240, 240, 240, 128}, TJPF_CMYK, TJSAMP_420);
     EXPECT_TRUE(isNear(dark, {120, 120, 120, 255}));
     // Without it the same components (15, 128, 128, 128 in the file) are ink.
     auto const marker = dark.begin() + static_cast<std::ptrdiff_t>(Find(dark, {0xFF, 0xEE}));

@@ -1,9 +1,6 @@
-#include "moka/base/String.h"
 #include "tests/support/Allocation.h"
 #include "tests/unit/codec/CodecTestSupport.h"
 
-#include <gmock/gmock.h>
-#include <gtest/gtest.h>
 #include <sys/stat.h>
 #include <unistd.h>
 #include <zlib.h>
@@ -12,11 +9,8 @@
 namespace Moka::Testing {
 namespace {
 
-using ::testing::AllOf;
 using ::testing::Each;
-using ::testing::ElementsAre;
 using ::testing::EndsWith;
-using ::testing::HasSubstr;
 using ::testing::SizeIs;
 
 struct Kind {
@@ -73,19 +67,13 @@ TEST_F(Malformed, EveryCutIsRefusedAndEveryChangedByteToo) {
 
 Bytes MakePngHeader(std::uint32_t width, std::uint32_t height) {
     Bytes file = Encode(MakeOpaqueNoise(4, 4), "png");
-    auto const store = [&file](std::size_t at, std::uint32_t value) {
-        for (std::size_t i = 0; i < 4; ++i) file[at + i] = static_cast<unsigned char>(value >> (24 - 8 * i));
-    };
-    store(16, width);
-    store(20, height);
-    store(29, static_cast<std::uint32_t>(crc32(0, &file[12], 17)));
-    return file;
+    file = Replace(file, 16, ToBigEndian(width, 4) + ToBigEndian(height, 4));
+    return Replace(file, 29, ToBigEndian(crc32(0, &file[12], 17), 4));
 }
 
 // An extended header, whose flags and two sides, less one, follow.
 Bytes MakeWebpHeader(Bytes const& rest) {
-    Bytes const file{'R', 'I', 'F', 'F', 22, 0, 0, 0, 'W', 'E', 'B', 'P', 'V', 'P', '8', 'X', 10, 0, 0, 0};
-    return Insert(file, file.size(), rest);
+    return Bytes{'R', 'I', 'F', 'F', 22, 0, 0, 0, 'W', 'E', 'B', 'P', 'V', 'P', '8', 'X', 10, 0, 0, 0} + rest;
 }
 
 TEST_F(Malformed, ClaimsOutsideTheLimitsAreRefusedBeforeAnythingIsAllocated) {
@@ -152,10 +140,6 @@ TEST_F(Malformed, WhatIsNoImageFileIsRefusedByEveryReader) {
     EXPECT_EQ(errors.Take().size(), 2u);
 }
 
-void Append(Bytes& bytes, std::uint64_t value, int count) {
-    for (int i = 0; i < count; ++i) bytes.push_back(static_cast<unsigned char>(value >> (8 * i)));
-}
-
 struct Fields {
     std::uint64_t width = 3;
     std::uint64_t height = 2;
@@ -166,16 +150,12 @@ struct Fields {
 };
 
 Bytes MakeMki(Fields const& fields, Bytes const& payload) {
-    Bytes bytes = {'M', 'K', 'I', '1'};
-    Append(bytes, fields.width, 4);
-    Append(bytes, fields.height, 4);
-    Append(bytes, fields.format, 2);
-    Append(bytes, fields.compression, 2);
-    Append(bytes, payload.size() + static_cast<std::uint64_t>(fields.payloadError), 8);
-    Append(bytes, crc32(0, bytes.data(), 24), 4);
-    Append(bytes, fields.zeros, 4);
-    bytes.insert(bytes.end(), payload.begin(), payload.end());
-    return bytes;
+    std::uint64_t const length = payload.size() + static_cast<std::uint64_t>(fields.payloadError);
+    Bytes const header = Bytes{'M', 'K', 'I', '1'} + ToLittleEndian(fields.width, 4) +
+                         ToLittleEndian(fields.height, 4) + ToLittleEndian(fields.format, 2) +
+                         ToLittleEndian(fields.compression, 2) + ToLittleEndian(length, 8);
+    return header + ToLittleEndian(crc32(0, header.data(), 24), 4) + ToLittleEndian(fields.zeros, 4) +
+           payload;
 }
 
 Bytes Compress(Bytes const& content, int level = 1, bool hasChecksum = true, bool hasSize = true) {

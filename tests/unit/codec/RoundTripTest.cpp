@@ -1,11 +1,7 @@
-#include "moka/base/Bitmap.h"
-#include "moka/base/String.h"
 #include "tests/unit/codec/CodecTestSupport.h"
 
 #include "moka/base/codec/RowScaler.h"
-#include <algorithm>
 #include <cmath>
-#include <gtest/gtest.h>
 #include <random>
 #include <utility>
 

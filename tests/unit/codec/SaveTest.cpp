@@ -1,20 +1,12 @@
-#include "moka/base/Bitmap.h"
-#include "moka/base/String.h"
 #include "tests/unit/codec/CodecTestSupport.h"
 
 #include <fstream>
-#include <gmock/gmock.h>
-#include <gtest/gtest.h>
 #include <iterator>
 #include <sys/stat.h>
 #include <unistd.h>
 
 namespace Moka::Testing {
 namespace {
-
-using ::testing::AllOf;
-using ::testing::ElementsAre;
-using ::testing::HasSubstr;
 
 Bytes const kOld = {'o', 'l', 'd'};
 

@@ -1,14 +1,13 @@
 // The three checkers: each call reaches the wrapped object as if made on it, until the last Unref.
 #include "moka/base/log/AndroidLog.h"
-#include "moka/graphics/bitmap/MKBitmap.h"
 #include "moka/graphics/debug/MKBitmapChecker.h"
 #include "moka/graphics/debug/MKCanvasChecker.h"
 #include "moka/graphics/debug/MKPenCanvasChecker.h"
+#include "tests/support/reference/ReferenceBitmap.h"
 #include "tests/unit/canvas/CanvasFixture.h"
 
 #include <atomic>
 #include <chrono>
-#include <deque>
 #include <stdexcept>
 #include <thread>
 
@@ -231,13 +230,8 @@ TEST_F(Checkers, RefuseEveryOperationAfterTheLastUnref) {
                   }));
 }
 
-struct CountedBitmap final : MKBitmap {
-    CountedBitmap() : MKBitmap(nullptr, 0, 0, 1, 1) {}
-    unsigned int GetPixel(Point const&) override { return 0; }
-    void GetPixelAsync(Point const&, void*, PixelCallback) override {}
-    void GetBitmapData(Rect const&, void*) override {}
-    void GetBitmapDataAsync(Rect const&, void*, void*, DataCallback) override {}
-    IMKBitmap* Clone() override { return nullptr; }
+struct CountedBitmap final : ReferenceBitmap {
+    using ReferenceBitmap::ReferenceBitmap;
     int Unref() override { return ++unrefs; }
 
     std::atomic<int> unrefs{0};
@@ -248,7 +242,7 @@ struct CountedBitmap final : MKBitmap {
 TEST_F(Checkers, CountExactlyFromSeveralThreads) {
     using Clock = std::chrono::steady_clock;
     constexpr int kCheckers = 5000;
-    CountedBitmap wrapped;
+    CountedBitmap wrapped(Picture(1, 1));
     std::deque<MKBitmapChecker> checkers;
     for (int i = 0; i < kCheckers; ++i) checkers.emplace_back(&wrapped);
 

@@ -4,7 +4,7 @@
 #include "moka/graphics/loader/BitmapLoader.h"
 
 #include <chrono>
-#include <cstdio>
+#include <sstream>
 #include <type_traits>
 
 namespace Moka::Testing {
@@ -26,14 +26,11 @@ protected:
     static constexpr char const* kName =
         std::is_same_v<L, MKBitmapLoader> ? "MKBitmapLoader" : "BitmapLoader";
 
-    static std::string Format(char const* format, void const* address) {
-        char text[64];
-        std::snprintf(text, sizeof text, format, address);
-        return text;
-    }
     // A line of the front end named "pad".
-    std::string Line(L const& loader, std::string const& rest) const {
-        return kName + Format("[%p:pad] ", &loader) + rest;
+    static std::string Line(L const& loader, std::string const& rest) {
+        std::ostringstream line;
+        line << kName << '[' << &loader << ":pad] " << rest;
+        return line.str();
     }
 };
 using FrontEnds = ::testing::Types<MKBitmapLoader, BitmapLoader>;

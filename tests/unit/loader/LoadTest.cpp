@@ -3,8 +3,6 @@
 
 #include "tests/support/Queues.h"
 
-#include <future>
-
 namespace Moka::Testing {
 namespace {
 

@@ -13,20 +13,14 @@
 #include "moka/graphics/loader/BitmapLoaderImpl.h"
 #include "moka/graphics/loader/MKBitmapLoader.h"
 #include "tests/support/LogCapture.h"
-#include "tests/support/RendererTrace.h"
 #include "tests/support/TestFiles.h"
 #include "tests/support/TracingThread.h"
 #include "tests/unit/loader/CodecGate.h"
 
 #include <algorithm>
-#include <filesystem>
 #include <functional>
 #include <gtest/gtest.h>
 #include <memory>
-#include <mutex>
-#include <string>
-#include <thread>
-#include <vector>
 
 namespace Moka::Testing {
 

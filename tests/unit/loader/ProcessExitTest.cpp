@@ -13,7 +13,6 @@
 
 #include <cstdlib>
 #include <gtest/gtest.h>
-#include <memory>
 
 namespace Moka::Testing {
 namespace {

@@ -1,10 +1,10 @@
 // Saves through the loader's loop, seen by a listener.
 #include "tests/unit/loader/LoaderFixture.h"
 
-#include "moka/graphics/bitmap/MKBitmap.h"
 #include "moka/graphics/loader/BitmapLoader.h"
 #include "tests/support/Allocation.h"
 #include "tests/support/Queues.h"
+#include "tests/support/reference/ReferenceBitmap.h"
 
 #include <cstring>
 #include <limits>
@@ -13,19 +13,14 @@ namespace Moka::Testing {
 namespace {
 
 // A bitmap whose read-back calls back when the test says so.
-class HeldBitmap final : public MKBitmap {
+class HeldBitmap final : public ReferenceBitmap {
 public:
-    HeldBitmap(int width, int height) : MKBitmap(nullptr, 0, 0, width, height) {}
+    using ReferenceBitmap::ReferenceBitmap;
     void GetBitmapDataAsync(Rect const& r, void* destination, void* userData,
                             DataCallback callback) override {
         std::memset(destination, 0xFF, static_cast<std::size_t>(GetWidth() * GetHeight() * 4));
         deliver = [=] { callback(r, destination, userData); };
     }
-    unsigned int GetPixel(Point const&) override { return 0; }
-    void GetPixelAsync(Point const&, void*, PixelCallback) override {}
-    void GetBitmapData(Rect const&, void*) override {}
-    IMKBitmap* Clone() override { return nullptr; }
-
     std::function<void()> deliver;
 };
 
@@ -82,7 +77,7 @@ TEST_F(Save, WhatABitmapDoesNotCoverIsTransparent) {
 TEST_F(Save, WaitersWaitForTheReadBackAndTheFile) {
     image = Picture(4, 3);
     std::fill(image.pixels.begin(), image.pixels.end(), static_cast<unsigned char>(0xFF));
-    HeldBitmap bitmap(4, 3);
+    HeldBitmap bitmap(Picture(4, 3));
     EXPECT_TRUE(Loader().RequestSave(&listener, 1, Path("s.png"), bitmap, nullptr, 100));
     std::vector<std::thread> waiters;
     for (int i = 0; i < 3; ++i)
@@ -112,7 +107,7 @@ TEST_F(Save, WaitingForAllRunsTheRenderThreadsTasksFirst) {
 
 // Pending, waiting in the queue, and being encoded.
 TEST_F(Save, ARemovedCallbackLeavesTheFile) {
-    HeldBitmap bitmap(4, 3);
+    HeldBitmap bitmap(Picture(4, 3));
     RecordingListener other;
     EXPECT_TRUE(Loader().RequestSave(&listener, 1, Path("pending.png"), bitmap, nullptr, 100));
     CodecGate gate;

@@ -1,69 +1,25 @@
 // What the recorder keeps over flushes, contexts and threads. Pictures are for the tests with a driver.
-#include "moka/renderer/record/Recorder.h"
-#include "moka/renderer/IParameterBinding.h"
-#include "moka/renderer/IRasterizerState.h"
-#include "moka/renderer/IRenderTarget.h"
-#include "moka/renderer/IShaderProgram.h"
-#include "moka/renderer/ITextureObject.h"
-#include "moka/renderer/RendererFactory.h"
-#include "moka/renderer/record/ProgramState.h"
-#include "tests/support/RendererTrace.h"
+#include "tests/unit/renderer/RecorderFixture.h"
 
-#include <gtest/gtest.h>
+#include "moka/renderer/IRasterizerState.h"
+#include "moka/renderer/record/ProgramState.h"
 
 #include <cstring>
-#include <memory>
 #include <thread>
-#include <utility>
 
 namespace Moka::Testing {
 namespace {
 
 constexpr std::uint64_t kBytes = 4 * sizeof(float); // of the vertices that these tests hand over
 
-class RecorderTest : public ::testing::Test {
+class RecorderTest : public RecorderFixture {
 protected:
-    RecorderTest() {
-        RendererTrace::Reset();
-        RendererFactory::AttachContext();
-        RendererFactory::SetDeferred(true);
-        VertexDescriptor descriptor;
-        descriptor.addAttribute(VertexAttributeType::Float, 1, -1, 0);
-        graphics = RendererFactory::CreateGraphicsObject(1, PrimitiveType::TriangleList, &descriptor, 0, 0);
-        program = RendererFactory::CreateShaderProgram("", "uniform float uWidth;", "Sample");
-        width = program->GetParameter("uWidth");
-        texture = RendererFactory::CreateTextureObject(TextureDescriptor(2, 2, 0, 2, 6, 1, false, nullptr),
-                                                       nullptr, 0, {});
-        target = RendererFactory::CreateOffscreenRenderTarget(texture);
-        program->MakeCurrent();
-        target->Activate();
-        RendererFactory::Flush();
-    }
-    ~RecorderTest() override {
-        graphics->Release();
-        delete width;
-        program->Release();
-        if (target) target->Release();
-        delete texture;
-        RendererTrace::Reset();
-    }
-
-    void SetVertices(std::initializer_list<float> vertices) {
-        graphics->SetVertices(0, std::data(vertices), static_cast<int>(vertices.size()));
-    }
-    static std::uint64_t CountVertexBytes() { return RendererFactory::GetStatistics().vertexBytes; }
-    float GetWidthInForce() const {
+    static float GetWidthInForce() {
         float value = 0;
         std::memcpy(&value, detail::GetAttachedRecorder()->requested->GetProgram()->GetValues().data(),
                     sizeof value);
         return value;
     }
-
-    IGraphicsObject* graphics = nullptr;
-    IShaderProgram* program = nullptr;
-    IParameterBinding* width = nullptr;
-    ITextureObject* texture = nullptr;
-    IRenderTarget* target = nullptr;
 };
 
 TEST_F(RecorderTest, VerticesAreHandedOverOnceAndDrawnAgainAfterAFlush) {
@@ -73,12 +29,12 @@ TEST_F(RecorderTest, VerticesAreHandedOverOnceAndDrawnAgainAfterAFlush) {
     RendererFactory::GetRasterizerState()->SetScissorEnabled(true); // so that the next draw is not joined
     EXPECT_TRUE(graphics->Draw(1, 2, 1));
     RendererFactory::Flush();
-    EXPECT_EQ(CountVertexBytes(), kBytes);
+    EXPECT_EQ(Count().vertexBytes, kBytes);
     target->Activate();
     EXPECT_TRUE(graphics->Draw(1, 2, 1));
     RendererFactory::Flush();
-    EXPECT_EQ(CountVertexBytes(), 2 * kBytes);
-    EXPECT_EQ(RendererFactory::GetStatistics().draws, 3u);
+    EXPECT_EQ(Count().vertexBytes, 2 * kBytes);
+    EXPECT_EQ(Count().draws, 3u);
     for (TracedDraw const& draw : RendererTrace::GetDraws()) {
         EXPECT_EQ(draw.vertices[static_cast<std::size_t>(1 - draw.first)], 1);
     }
@@ -86,10 +42,7 @@ TEST_F(RecorderTest, VerticesAreHandedOverOnceAndDrawnAgainAfterAFlush) {
 
 // Vertices that nobody drew are replaced in the list only while they are its end.
 TEST_F(RecorderTest, VerticesOfTwoObjectsStayEachItsOwnWhicheverGetsNewOnes) {
-    VertexDescriptor descriptor;
-    descriptor.addAttribute(VertexAttributeType::Float, 1, -1, 0);
-    IGraphicsObject* const other =
-        RendererFactory::CreateGraphicsObject(1, PrimitiveType::TriangleList, &descriptor, 0, 0);
+    Released<IGraphicsObject> const other = MakeGraphics();
     float const vertices[] = {5, 6, 7};
     SetVertices({0, 1, 2});
     other->SetVertices(0, vertices, 3);
@@ -100,48 +53,40 @@ TEST_F(RecorderTest, VerticesOfTwoObjectsStayEachItsOwnWhicheverGetsNewOnes) {
     ASSERT_EQ(draws.size(), 2u);
     EXPECT_EQ(draws[0].vertices[0], 5);
     EXPECT_EQ(draws[1].vertices[0], 10);
-    other->Release();
 }
 
 TEST_F(RecorderTest, AProgramBuiltAgainInANewContextKeepsItsValuesAndHandles) {
-    float value = 2.5f;
-    width->Set(&value);
+    SetWidth(2.5f);
     RendererFactory::DetachContext();
-    value = 3;
-    width->Set(&value);
-    IShaderProgram* const homeless =
-        RendererFactory::CreateShaderProgram("", "uniform float uWidth;", "Late");
-    std::unique_ptr<IParameterBinding> early(homeless->GetParameter("uWidth"));
+    SetWidth(3);
+    Released<IShaderProgram> const homeless = MakeProgram();
+    std::unique_ptr<IParameterBinding> const early(homeless->GetParameter("width"));
     EXPECT_EQ(early->GetType(), BindingTypeUnknown);
     RendererFactory::AttachContext();
-    EXPECT_EQ(RendererFactory::GetStatistics().programs, 0);
+    EXPECT_EQ(Count().programs, 0);
     program->MakeCurrent();
-    EXPECT_EQ(RendererFactory::GetStatistics().programs, 1);
+    EXPECT_EQ(Count().programs, 1);
     EXPECT_EQ(GetWidthInForce(), 3);
-    value = 4;
-    width->Set(&value);
+    SetWidth(4);
     EXPECT_EQ(GetWidthInForce(), 4);
     // One that was created without a context takes values once it was built.
     homeless->MakeCurrent();
-    early.reset(homeless->GetParameter("uWidth"));
-    value = 5;
-    early->Set(&value);
+    width.reset(homeless->GetParameter("width"));
+    SetWidth(5);
     EXPECT_EQ(GetWidthInForce(), 5);
-    homeless->Release();
 }
 
 TEST_F(RecorderTest, WhatAnotherThreadDropsIsDeletedByTheNextRequestThatFindsItUnused) {
     target->ClearColor(1, 1, 1, 1);
     target->Deactivate(false, false);
-    target->Release();
-    target = nullptr;
-    std::thread([this] { delete std::exchange(texture, nullptr); }).join();
-    EXPECT_EQ(RendererFactory::GetStatistics().textureObjects, 0);
+    target.reset();
+    std::thread([this] { texture.reset(); }).join();
+    EXPECT_EQ(Count().textureObjects, 0);
     program->MakeCurrent();
-    EXPECT_EQ(RendererFactory::GetStatistics().textures, 1) << "the clear waits in the list";
+    EXPECT_EQ(Count().textures, 1) << "the clear waits in the list";
     RendererFactory::Flush();
-    EXPECT_EQ(RendererFactory::GetStatistics().textures, 0);
-    EXPECT_EQ(RendererFactory::GetStatistics().frameBuffers, 0);
+    EXPECT_EQ(Count().textures, 0);
+    EXPECT_EQ(Count().frameBuffers, 0);
 }
 
 } // namespace

@@ -2,66 +2,21 @@
 #include "moka/renderer/IBlendStateObject.h"
 #include "moka/renderer/IDepthStencilBuffer.h"
 #include "moka/renderer/IDepthStencilState.h"
-#include "moka/renderer/IParameterBinding.h"
-#include "moka/renderer/IRenderTarget.h"
-#include "moka/renderer/IShaderProgram.h"
-#include "moka/renderer/ITextureObject.h"
-#include "moka/renderer/RendererFactory.h"
-#include "moka/renderer/record/Recorder.h"
-#include "tests/support/RendererTrace.h"
-
-#include <gtest/gtest.h>
+#include "tests/unit/renderer/RecorderFixture.h"
 
 namespace Moka::Testing {
 namespace {
 
-constexpr int kSize = 100;
-
-template <class T>
-struct ReleaseIt {
-    void operator()(T* object) const { object->Release(); }
-};
-template <class T>
-using Released = std::unique_ptr<T, ReleaseIt<T>>;
-
-class StencilPreparationsTest : public ::testing::Test {
+class StencilPreparationsTest : public RecorderFixture {
 protected:
     StencilPreparationsTest() {
-        RendererTrace::Reset();
-        RendererFactory::AttachContext();
-        RendererFactory::SetDeferred(true);
-        VertexDescriptor layout;
-        layout.addAttribute(VertexAttributeType::Float, 1, -1, 0);
-        graphics.reset(RendererFactory::CreateGraphicsObject(1, PrimitiveType::TriangleList, &layout, 0, 0));
-        maskProgram.reset(RendererFactory::CreateShaderProgram("", "uniform float width;", "mask"));
-        width.reset(maskProgram->GetParameter("width"));
-        program.reset(RendererFactory::CreateShaderProgram("", "uniform float width;", "program"));
-        blend.reset(RendererFactory::CreateBlendStateObject(BlendStateDescriptor(true)));
-        state.reset(RendererFactory::CreateDepthStencilState({false, false}));
-        for (Strip& strip : strips) {
-            strip.texture.reset(RendererFactory::CreateTextureObject(
-                TextureDescriptor(kSize, kSize, 0, 2, 6, 1, false, nullptr), nullptr, 0, {}));
-            strip.target.reset(RendererFactory::CreateOffscreenRenderTarget(strip.texture.get()));
-        }
-        buffer.reset(RendererFactory::CreateDepthStencilBuffer(kSize, kSize));
-        TakeStrip(0);
+        TakeStrip(*target);
         RendererFactory::Flush();
     }
-    ~StencilPreparationsTest() override {
-        active->DetachDepthStencil();
-        buffer.reset();
-        for (Strip& strip : strips) strip = {};
-        graphics.reset();
-        width.reset();
-        maskProgram.reset();
-        program.reset();
-        blend.reset();
-        state.reset();
-        RendererTrace::Reset();
-    }
+    ~StencilPreparationsTest() override { active->DetachDepthStencil(); }
 
-    void TakeStrip(std::size_t index) {
-        active = strips[index].target.get();
+    void TakeStrip(IRenderTarget& strip) {
+        active = &strip;
         active->Activate();
         active->AttachDepthStencil(buffer.get());
     }
@@ -79,22 +34,20 @@ protected:
     }
 
     void DrawTriangle(float number) const {
-        float const vertices[] = {number, 1, 2};
-        graphics->SetVertices(0, vertices, 3);
+        SetVertices({number, 1, 2});
         graphics->Draw(0, -1, 1);
     }
     void Prepare(float value, float vertex) const {
         active->ClearDepthStencil(false, 1, true, 0);
-        maskProgram->MakeCurrent();
-        width->Set(&value);
+        program->MakeCurrent();
+        SetWidth(value);
         ApplyStates(false, StencilReplace, 0xFF);
         DrawTriangle(vertex);
     }
     void Draw(DrawBounds const& bounds) const {
-        program->MakeCurrent();
+        callers->MakeCurrent();
         ApplyStates(true, StencilKeep, 0);
-        float const vertices[] = {0, 1, 2};
-        graphics->SetVertices(0, vertices, 3);
+        SetVertices({0, 1, 2});
         graphics->SetBounds(bounds);
         graphics->Draw(0, -1, 1);
     }
@@ -112,7 +65,7 @@ protected:
         case 'D':
             return Draw({-1, -1, 1, 1});
         case 'w': // a draw of the caller's that writes the stencil
-            program->MakeCurrent();
+            callers->MakeCurrent();
             ApplyStates(true, StencilIncrementSaturate, 0xFF);
             return DrawTriangle(5);
         case 'c':
@@ -121,8 +74,8 @@ protected:
             return active->ClearDepthStencil(true, 1, false, 0);
         case 'k': // the program that prepares goes
             width.reset();
-            maskProgram.reset(RendererFactory::CreateShaderProgram("", "uniform float width;", "mask"));
-            width.reset(maskProgram->GetParameter("width"));
+            program = MakeProgram();
+            width.reset(program->GetParameter("width"));
             return;
         case 'f':
             return RendererFactory::Flush();
@@ -130,7 +83,7 @@ protected:
             active->Deactivate(false, true);
             return active->Activate();
         case 's':
-            return TakeStrip(1);
+            return TakeStrip(*otherTarget);
         case 'e':
             RendererFactory::Commit();
             return RendererFactory::InvalidateState();
@@ -141,19 +94,14 @@ protected:
         }
     }
 
-    struct Strip {
-        std::unique_ptr<ITextureObject> texture;
-        Released<IRenderTarget> target;
-    };
-    Strip strips[2];
-    Released<IDepthStencilBuffer> buffer;
+    std::unique_ptr<ITextureObject> otherTexture{RendererFactory::CreateTextureObject(
+        TextureDescriptor(kSize, kSize, 0, 2, 6, 1, false, nullptr), nullptr, 0, {})};
+    Released<IRenderTarget> otherTarget{RendererFactory::CreateOffscreenRenderTarget(otherTexture.get())};
+    Released<IDepthStencilBuffer> buffer{RendererFactory::CreateDepthStencilBuffer(kSize, kSize)};
     IRenderTarget* active = nullptr;
-    Released<IGraphicsObject> graphics;
-    Released<IShaderProgram> maskProgram;
-    std::unique_ptr<IParameterBinding> width;
-    Released<IShaderProgram> program;
-    Released<IBlendStateObject> blend;
-    Released<IDepthStencilState> state;
+    Released<IShaderProgram> callers = MakeProgram();
+    Released<IBlendStateObject> blend{RendererFactory::CreateBlendStateObject(BlendStateDescriptor(true))};
+    Released<IDepthStencilState> state{RendererFactory::CreateDepthStencilState({false, false})};
 };
 
 TEST_F(StencilPreparationsTest, OneIsDrawnAgainOnlyWhenTheBufferMayHoldSomethingElse) {
@@ -178,12 +126,12 @@ TEST_F(StencilPreparationsTest, OneIsDrawnAgainOnlyWhenTheBufferMayHoldSomething
         {"pdipd", 2},    {"ipdpd", 2},  {"ipdIpd", 2},
     };
     for (auto const& [steps, clears] : cases) {
-        TakeStrip(0);
+        TakeStrip(*target);
         RendererFactory::SetDeferred(true);
-        std::uint64_t const before = RendererFactory::GetStatistics().clears;
+        std::uint64_t const before = Count().clears;
         for (char const* step = steps; *step != 0; ++step) Do(*step);
         RendererFactory::Flush();
-        EXPECT_EQ(RendererFactory::GetStatistics().clears - before, clears) << steps;
+        EXPECT_EQ(Count().clears - before, clears) << steps;
     }
 }
 
