@@ -48,11 +48,15 @@ TEST_F(SamplesTest, ATerminalShowsHowManyFilesAreDoneAndIsCleanAtTheEnd) {
             std::chrono::milliseconds(1100)); // work of less than a second shows nothing
     }
     dup2(stderrOfTest, STDERR_FILENO);
+    // The terminal ends when nobody has it open any more, and hands over what was written in pieces.
+    for (int const file : {other, stderrOfTest}) close(file);
+    std::string text;
     char shown[512];
-    std::string const text(shown, static_cast<std::size_t>(read(own, shown, sizeof(shown))));
+    for (ssize_t bytes = 0; (bytes = read(own, shown, sizeof(shown))) > 0;)
+        text.append(shown, static_cast<std::size_t>(bytes));
+    close(own);
     EXPECT_THAT(text,
                 ::testing::MatchesRegex("(\r.\\[Kconvert  9/10  90%  [0-9.]+ files/s  0:00 left)+\r.\\[K"));
-    for (int const file : {own, other, stderrOfTest}) close(file);
 }
 
 } // namespace
