@@ -47,7 +47,7 @@ TEST_F(PixelBitmap, RoundTripsEveryStripCountBitForBit) {
             }
 }
 
-TEST_F(PixelBitmap, ReadsBlocksOverStripEdgesAndPartlyOutside) {
+TEST_F(PixelBitmap, ReadsBlocksOverStripEdgesAndPartlyOutsideAndReplacesABlockOfAWiderImage) {
     Picture const image = MakeGradient(40, 2 * kMaxSide + 20);
     auto const bitmap = Create(image);
     ExpectSame(Read(bitmap, Rect(3, kMaxSide - 5, 31, 2 * kMaxSide + 7)),
@@ -59,6 +59,10 @@ TEST_F(PixelBitmap, ReadsBlocksOverStripEdgesAndPartlyOutside) {
     for (int y = 0; y < 20; ++y)
         for (int x = 0; x < 40; ++x) expected.SetColor(x + 2, y, image.GetColor(x, 2 * kMaxSide + y));
     ExpectSame(block, expected);
+
+    Picture const wide = MakeAlphaPattern(30, 20);
+    bitmap->GetTextureBitmap()->UpdateBitmap(Rect(5, 2, 15, 9), wide.pixels.data(), wide.GetStride());
+    ExpectSame(Read(bitmap, Rect(5, 2, 15, 9)), wide.Crop(0, 0, 10, 7));
 }
 
 TEST_F(PixelBitmap, AShareSeesUpdatesWhoeverGoesFirstAndAStripsCloneDoesNot) {
