@@ -13,7 +13,9 @@
 #include <atomic>
 #include <cstdlib>
 #include <future>
+#include <mutex>
 #include <new>
+#include <string>
 #include <utility>
 
 namespace Moka {
@@ -75,10 +77,15 @@ public:
     }
 
 private:
-    // Once in a process: a file that could not be written or that filled the disk is told once.
+    // Each file once in a process: a file that cannot be written, or that filled the disk, is reported once.
     static char const* TakeEnvironment() {
-        static std::atomic<bool> isTaken{false};
-        return Trace::IsOn() || isTaken.exchange(true) ? nullptr : std::getenv("MOKA_TRACE");
+        static std::mutex lock;
+        static std::string taken;
+        char const* const wanted = Trace::IsOn() ? nullptr : std::getenv("MOKA_TRACE");
+        std::lock_guard const guard(lock);
+        if (!wanted || taken == wanted) return nullptr;
+        taken = wanted;
+        return wanted;
     }
 
     bool const mIsOwn;
