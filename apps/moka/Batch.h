@@ -16,7 +16,7 @@ namespace Moka::Tool {
 
 struct BatchRequest {
     std::vector<BatchFile> files;
-    std::string folder; // created after the driver is found, and removed again if no file was written
+    std::string folder; // created once a driver is found; removed if it stays empty
     ConversionOptions options;
     int inFlight = 1;
 };

@@ -93,7 +93,7 @@ public:
     PageText Take() { return std::move(mResult); }
 
     // Reads the layout of WritePage line by line, which needs no tree of the whole page. Returns false and reads nothing
-    // if the text has another layout.
+    // if the JSON is laid out in another way.
     bool ReadLines(std::string_view text) {
         std::size_t const start = text.find(kStart);
         if (start == std::string_view::npos) return false;

@@ -152,7 +152,7 @@ public:
     }
 
 private:
-    // Bytes of a block up to the end of the last event that was written with room for the file's end.
+    // The bytes of a block that the file keeps: its whole events, if the closing bracket fits after them.
     static off_t CountWhole(std::string const& block, std::size_t written) {
         std::size_t const whole = block.rfind(kSeparator, written - std::min(written, kEnd.size()));
         return whole == std::string::npos ? 0 : static_cast<off_t>(whole);

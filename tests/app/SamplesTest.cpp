@@ -48,7 +48,7 @@ TEST_F(SamplesTest, ATerminalShowsHowManyFilesAreDoneAndIsCleanAtTheEnd) {
             std::chrono::milliseconds(1100)); // work of less than a second shows nothing
     }
     dup2(stderrOfTest, STDERR_FILENO);
-    // The terminal ends when nobody has it open any more, and hands over what was written in pieces.
+    // A terminal delivers its output in several reads; they end once its other side is closed.
     for (int const file : {other, stderrOfTest}) close(file);
     std::string text;
     char shown[512];

@@ -207,7 +207,7 @@ TEST_F(NotebookStoreTest, AFailedSaveIsReportedAndLosesNothing) {
     EXPECT_FALSE(document->Close());
 }
 
-// Adds strokes without a pause, and writes to the pipe how many an autosave or a save has written to the disk.
+// Adds strokes without a pause. After each save and autosave it sends the number of saved strokes through the pipe.
 [[noreturn]] void WriteUntilKilled(Document& document, int pipe) {
     for (int count = 0;; ++count) {
         document.GetPage().Append(MakeDash(1, static_cast<float>(count)));
