@@ -2,6 +2,7 @@
 #include "moka/base/Bitmap.h"
 #include "moka/base/log/AndroidLog.h"
 #include "tests/jvm/JavaFixture.h"
+#include "tests/jvm/PatchedFunctions.h"
 #include "tests/support/Allocation.h"
 #include "tests/support/LogCapture.h"
 
@@ -125,17 +126,16 @@ TEST_F(JniBitmapTest, RefusesWhatItCannotFillAndLeavesIt) {
     unsigned char own[4] = {9, 9, 9, 9};
     Bitmap empty, full;
     ASSERT_TRUE(full.Construct(own, 1, 1, 4, Bitmap::kFormatRgba8888, false, false));
-    JNINativeInterface_ functions = {};
-    functions.ExceptionClear = [](JNIEnv*) {};
-    functions.PushLocalFrame = [](JNIEnv*, jint) -> jint { return JNI_ENOMEM; };
-    JNIEnv crowded = {};
-    crowded.functions = &functions;
     LogCapture log;
     EXPECT_FALSE(JNI_ConvertJavaToBitmap(mEnv, javaBitmap, nullptr, false));
     EXPECT_FALSE(JNI_ConvertJavaToBitmap(mEnv, javaBitmap, &full, false));
     EXPECT_EQ(full.GetBuffer(), own);
     EXPECT_FALSE(JNI_ConvertJavaToBitmap(nullptr, javaBitmap, &empty, false));
-    EXPECT_FALSE(JNI_ConvertJavaToBitmap(&crowded, javaBitmap, &empty, false));
+    {
+        PatchedFunctions crowded(mEnv);
+        crowded->PushLocalFrame = [](JNIEnv*, jint) -> jint { return JNI_ENOMEM; };
+        EXPECT_FALSE(JNI_ConvertJavaToBitmap(mEnv, javaBitmap, &empty, false));
+    }
     EXPECT_THAT(log.GetTexts(ANDROID_LOG_ERROR),
                 testing::ElementsAre(HasSubstr("there is no bitmap to fill"), HasSubstr("has pixels already"),
                                      HasSubstr("the thread has no JNIEnv"),
