@@ -29,9 +29,7 @@ protected:
 
 TEST_F(InterruptionTest, ASignalThatWasIgnoredStaysIgnored) {
     SaveNoise(1000, "short.mki");
-    ProcessOptions options;
-    options.ignoredSignal = SIGHUP;
-    MokaProcess process(mFolder.string(), Arguments("convert short.mki out.webp"), options);
+    MokaProcess process = Start("convert short.mki out.webp", "trap '' HUP;");
     ASSERT_TRUE(Soon([this] { return HasTemporary("."); }));
     process.Signal(SIGHUP);
     EXPECT_EQ(process.Wait().status, 0);
@@ -57,8 +55,7 @@ TEST_F(InterruptionTest, AtAnyMomentLeavesOnlyWholeFiles) {
         std::filesystem::remove_all(mFolder / "out");
         std::filesystem::create_directory(mFolder / "out");
         std::string const jobs = i % 2 == 0 ? "4" : "1";
-        MokaProcess process(mFolder.string(),
-                            Arguments("convert " + inputs + "--to mki --out out -q --jobs " + jobs));
+        MokaProcess process = Start("convert " + inputs + "--to mki --out out -q --jobs " + jobs);
         // Every third time in the middle of a save: the end of one is the beginning of the next.
         ASSERT_TRUE(Soon([&] {
             int const count = CountFiles();

@@ -32,11 +32,10 @@ Picture DrawWithoutWindow(int width, int height) {
 bool IsSame(Picture const& a, Picture const& b) { return CompareImages(a, b).largest <= 3; }
 
 TEST(ExampleTest, ShowsThePictureAtEverySizeAndCloses) {
-    ProcessOptions options;
-    options.program = theProgram;
-    options.environment = {"GDK_BACKEND=x11", "SDL_VIDEODRIVER=x11", "QT_QPA_PLATFORM=xcb",
-                           "QT_XCB_GL_INTEGRATION=xcb_egl"};
-    MokaProcess program(".", {}, options);
+    MokaProcess program(
+        ".", "GDK_BACKEND=x11 SDL_VIDEODRIVER=x11 QT_QPA_PLATFORM=xcb QT_XCB_GL_INTEGRATION=xcb_egl "
+             "exec '" +
+                 theProgram + "'");
     ExampleWindow window;
     ASSERT_TRUE(Soon([&] { return program.IsOver() || window.Grab(320, 240).width > 0; }));
     std::string const messages = program.GetError();

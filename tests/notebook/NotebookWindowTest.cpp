@@ -100,15 +100,17 @@ protected:
         EXPECT_TRUE(SaveImage(Scenes::MakePicture(2, 600, 400), mFolder.Path("photo.png")));
     }
 
-    std::unique_ptr<MokaProcess> Start(std::vector<std::string> arguments, ProcessOptions options = {}) {
-        arguments.insert(arguments.end(),
-                         {"--width", std::to_string(kWidth), "--height", std::to_string(kHeight)});
-        return std::make_unique<MokaProcess>(mFolder.GetPath().string(), std::move(arguments),
-                                             std::move(options));
+    // `before` stands before the program's name in the shell's command.
+    std::unique_ptr<MokaProcess> Start(std::string const& arguments, std::string const& before = {}) {
+        return std::make_unique<MokaProcess>(mFolder.GetPath().string(),
+                                             before + " exec '" MOKA_EXECUTABLE "' --width " +
+                                                 std::to_string(kWidth) + " --height " +
+                                                 std::to_string(kHeight) + " " + arguments);
     }
-    std::string WriteScript(Script const& script) {
+    std::unique_ptr<MokaProcess> Replay(Script const& script, std::string const& arguments,
+                                        std::string const& before = {}) {
         WriteFile(mFolder.Path("input.txt"), script.GetText());
-        return "input.txt";
+        return Start("--replay input.txt " + arguments, before);
     }
     // Runs xdotool on the window.
     static void Do(std::string const& what) {
@@ -178,7 +180,7 @@ TEST_F(NotebookWindowTest, ShowsThePixelsOfItsFileAndOpensItAgain) {
     script.Add("idle");
     script.Key('0');
     script.Key(1073741898); // Home
-    auto process = Start({"page.json", "--replay", WriteScript(script)});
+    auto process = Replay(script, "page.json");
     Picture const top = Grab();
     Do("key ctrl+s");
     ASSERT_TRUE(Soon([&] { return std::filesystem::exists(mFolder.Path("page.json")); }));
@@ -204,7 +206,7 @@ TEST_F(NotebookWindowTest, ShowsThePixelsOfItsFileAndOpensItAgain) {
     ExpectSame(GetPagePart(top), GetPagePart(Grab()), "zoomed back");
     Close(*process);
 
-    process = Start({}); // the last page
+    process = Start(""); // the last page
     ExpectSame(GetPagePart(top), GetPagePart(Grab()), "opened again");
     process->Signal(SIGTERM);
     EXPECT_EQ(process->Wait().status, 0);
@@ -213,12 +215,12 @@ TEST_F(NotebookWindowTest, ShowsThePixelsOfItsFileAndOpensItAgain) {
 TEST_F(NotebookWindowTest, AKillLosesNothingThatWasAutosaved) {
     Script script;
     WriteWord(script, 200, 250);
-    auto process = Start({"page.json", "--autosave", "0.1", "--replay", WriteScript(script)});
+    auto process = Replay(script, "page.json --autosave 0.1");
     Picture const before = Grab();
     process->Signal(SIGKILL);
     EXPECT_EQ(process->Wait().signal, SIGKILL);
     EXPECT_FALSE(std::filesystem::exists(mFolder.Path("page.json")));
-    process = Start({"page.json"});
+    process = Start("page.json");
     ExpectSame(GetPagePart(before), GetPagePart(Grab()), "after a kill");
     Close(*process);
     EXPECT_EQ(mFolder.List(), (std::vector<std::string>{"input.txt", "page.json", "photo.png", "state"}));
@@ -226,7 +228,7 @@ TEST_F(NotebookWindowTest, AKillLosesNothingThatWasAutosaved) {
 
 TEST_F(NotebookWindowTest, ABrokenPageAndAFullDiskAreReportedAndKeepTheirFile) {
     WriteFile(mFolder.Path("page.json"), "{\"size\": [1200, 1600], \"operations\": [");
-    auto process = Start({"page.json"});
+    auto process = Start("page.json");
     Picture const told = Grab();
     EXPECT_NE(told.GetColor(5, kHeight - 5), told.GetColor(5, kHeight - 200)) << "a message at the bottom";
     Do("key ctrl+s key Escape");
@@ -237,9 +239,7 @@ TEST_F(NotebookWindowTest, ABrokenPageAndAFullDiskAreReportedAndKeepTheirFile) {
 
     Script script;
     WriteWord(script, 200, 250);
-    ProcessOptions full;
-    full.fileSizeLimit = 3000;
-    process = Start({"full.json", "--replay", WriteScript(script)}, full);
+    process = Replay(script, "full.json", "ulimit -f 6;"); // 3072 bytes
     Picture const written = Grab();
     mWindow.Close();
     EXPECT_TRUE(Soon([&] { return !(mWindow.Grab(kWidth, kHeight) == written); }))
@@ -277,7 +277,7 @@ TEST_F(NotebookWindowTest, ExportsPastesAndOpensByKeysAndPrompts) {
     script.Drag({400, 400}, {500, 400});
     script.Key('s', kControl);
     script.Add("quit"); // while it saves
-    ProcessResult const result = Start({"page.json", "--replay", WriteScript(script)})->Wait();
+    ProcessResult const result = Replay(script, "page.json")->Wait();
     EXPECT_EQ(result.status, 0);
     for (char const* const told :
          {"cannot put ", "broken.png on the page", "cannot read the image", "no side above 16383",
@@ -293,27 +293,24 @@ TEST_F(NotebookWindowTest, TheRenderThreadDoesNotAllocateForInkAfterTheFirstFram
     Script script;
     for (float y = 200; y < 700; y += 100) WriteWord(script, 200, y);
     script.Add("quit");
-    ProcessResult const result =
-        Start({"page.json", "--statistics", "--replay", WriteScript(script)})->Wait();
+    ProcessResult const result = Replay(script, "page.json --statistics")->Wait();
     std::smatch count;
     ASSERT_TRUE(std::regex_search(result.out, count, std::regex("(\\d+) in the last")));
     EXPECT_LT(std::stoi(count[1]), 100) << "more allocations than the growth of some vectors";
 }
 
 TEST_F(NotebookWindowTest, ReportsStartFailuresWithARemedy) {
-    struct Case {
-        std::vector<std::string> arguments;
-        std::string environment;
+    struct {
+        char const* arguments;
+        char const* environment;
         char const* message;
         int status;
-    };
-    for (Case const& c : {Case{{}, "DISPLAY=:none", "is DISPLAY set?", 1},
-                          Case{{}, "__EGL_VENDOR_LIBRARY_DIRS=/nonexistent", "RenderThread: ", 1},
-                          Case{{"--replay", "none.txt"}, "A=b", "cannot read none.txt", 1},
-                          Case{{"--autosave", "x"}, "A=b", "--help", 2}}) {
-        ProcessOptions options;
-        options.environment = {c.environment};
-        ProcessResult const result = Start(c.arguments, options)->Wait();
+    } const cases[] = {{"", "DISPLAY=:none", "is DISPLAY set?", 1},
+                       {"", "__EGL_VENDOR_LIBRARY_DIRS=/nonexistent", "RenderThread: ", 1},
+                       {"--replay none.txt", "", "cannot read none.txt", 1},
+                       {"--autosave x", "", "--help", 2}};
+    for (auto const& c : cases) {
+        ProcessResult const result = Start(c.arguments, c.environment)->Wait();
         EXPECT_EQ(result.status, c.status) << c.message;
         EXPECT_THAT(result.err, HasSubstr(c.message));
     }
