@@ -17,6 +17,10 @@
 namespace Moka::Testing {
 namespace {
 
+// What the toolkits need to use the X server.
+constexpr char const* kOnX =
+    "GDK_BACKEND=x11 SDL_VIDEODRIVER=x11 QT_QPA_PLATFORM=xcb QT_XCB_GL_INTEGRATION=xcb_egl ";
+
 std::string theProgram;
 
 Picture DrawWithoutWindow(int width, int height) {
@@ -32,10 +36,7 @@ Picture DrawWithoutWindow(int width, int height) {
 bool IsSame(Picture const& a, Picture const& b) { return CompareImages(a, b).largest <= 3; }
 
 TEST(ExampleTest, ShowsThePictureAtEverySizeAndCloses) {
-    MokaProcess program(
-        ".", "GDK_BACKEND=x11 SDL_VIDEODRIVER=x11 QT_QPA_PLATFORM=xcb QT_XCB_GL_INTEGRATION=xcb_egl "
-             "exec '" +
-                 theProgram + "'");
+    MokaProcess program(".", kOnX + ("exec '" + theProgram + "'"));
     ExampleWindow window;
     ASSERT_TRUE(Soon([&] { return program.IsOver() || window.Grab(320, 240).width > 0; }));
     std::string const messages = program.GetError();
