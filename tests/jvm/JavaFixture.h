@@ -55,14 +55,6 @@ protected:
         return recycled;
     }
 
-    jobject MakeObject(char const* className) const {
-        mEnv->PushLocalFrame(4);
-        jclass const type = mEnv->FindClass(className);
-        jobject const made = mEnv->NewObject(type, mEnv->GetMethodID(type, "<init>", "()V"));
-        EXPECT_FALSE(mEnv->ExceptionCheck());
-        return mEnv->PopLocalFrame(made);
-    }
-
     JNIEnv* const mEnv = JavaMachine::GetMainEnv();
 };
 

@@ -96,7 +96,8 @@ TEST_F(JniBitmapTest, RefusesWhatIsNoBitmapOfItsKindOrSizeBeforeAllocatingAnythi
     for (auto const& [width, height, rowBytes, config, reason] : cases)
         ExpectRefusal({width, height, rowBytes, config, {}, nullptr}, reason);
     ExpectRefusal(jobject{}, "there is no Java bitmap");
-    ExpectRefusal(MakeObject("java/lang/Object"), "getConfig: java.lang.NoSuchMethodError");
+    ExpectRefusal(mEnv->AllocObject(mEnv->FindClass("java/lang/Object")),
+                  "getConfig: java.lang.NoSuchMethodError");
     ExpectRefusal(JavaPicture(), "out of memory");
 }
 
@@ -111,8 +112,10 @@ TEST_F(JniBitmapTest, ReportsWhatIsThrownAndLeavesNothingPending) {
         source.failing = mute.c_str();
         ExpectRefusal(source, method + ": an exception that cannot be described");
     }
-    ExpectRefusal(MakeObject("android/graphics/Bitmap$WithoutCopy"),
-                  "copyPixelsToBuffer: java.lang.NoSuchMethodError");
+    {
+        PatchedFunctions const missing(mEnv, "copyPixelsToBuffer");
+        ExpectRefusal(JavaPicture(), "copyPixelsToBuffer: java.lang.NoSuchMethodError");
+    }
     // A bitmap that has more than it said; what Java wrote before it noticed is dropped.
     ExpectRefusal({1, 1, 4, "ARGB_8888", {1, 2, 3, 4, 5}, nullptr}, "java.nio.BufferOverflowException");
     jobject const javaBitmap = MakeJavaBitmap();

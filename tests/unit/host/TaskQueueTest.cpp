@@ -59,23 +59,6 @@ FunctionTask* MakeTask(std::function<void()> function) {
     return new (std::nothrow) FunctionTask(std::move(function));
 }
 
-// Holds the consumer inside a task until opened, so that a test decides what is queued behind it.
-class Gate {
-public:
-    explicit Gate(TaskQueue& queue) {
-        queue.Post(MakeTask([this] {
-            mEntered.set_value();
-            mOpened.get_future().wait();
-        }));
-    }
-    void AwaitEntered() { mEntered.get_future().wait(); }
-    void Open() { mOpened.set_value(); }
-
-private:
-    std::promise<void> mEntered;
-    std::promise<void> mOpened;
-};
-
 class TaskQueueTest : public testing::Test {
 protected:
     void TearDown() override { EXPECT_EQ(FunctionTask::CountAlive(), 0); }
@@ -114,12 +97,9 @@ TEST_F(TaskQueueTest, StoppingRunsWhatTasksPostAndThenRefuses) {
         if (++chain == 1000) return;
         EXPECT_TRUE(queue->Post(MakeTask(link)));
     };
-    queue->Start();
-    Gate gate(*queue);
     queue->Post(MakeTask(link));
-    gate.AwaitEntered();
     queue->RequestStop();
-    gate.Open();
+    queue->Start();
     queue->Stop();
     EXPECT_EQ(chain, 1000);
 
@@ -183,11 +163,8 @@ TEST_F(TaskQueueTest, DestructionFreesWhatNobodyRanAndLetsWaitersGo) {
 }
 
 TEST_F(TaskQueueTest, WaitingDoesNotAwaitWhatWasPostedAfter) {
-    QueueThread queue;
-    Gate first(queue);
-    queue.Start();
-    first.AwaitEntered();
-    queue.Post(MakeTask([] {})); // taken over in one list with what follows it
+    QueueThread queue; // starts once all is posted, and takes it over in one list
+    queue.Post(MakeTask([] {}));
     std::promise<void> waited;
     std::thread waiter([&] {
         queue.WaitForTasks();
@@ -200,7 +177,7 @@ TEST_F(TaskQueueTest, WaitingDoesNotAwaitWhatWasPostedAfter) {
     }));
     std::thread later([&queue] { queue.WaitForTasks(); }); // for more than the first, which it must not delay
     std::this_thread::sleep_for(std::chrono::milliseconds(50));
-    first.Open();
+    queue.Start();
     waiter.join();
     later.join();
     queue.Stop();
