@@ -1,4 +1,5 @@
-// Traces: a file that other programs' parsers read, with everything that happened and nothing twice.
+// Traces: a file that other programs' parsers read, with everything that happened and nothing twice. Traced is the library
+// over the device without a driver, as an application's own tests can use it.
 #include "moka/base/Trace.h"
 
 #include "moka/base/log/AndroidLog.h"
@@ -99,6 +100,7 @@ void Work(RenderThread& queue, int rectangles) {
     for (int i = 0; i < rectangles; ++i) canvas->DrawRect(0, 0, 8, 8, nullptr);
     canvas->ClearAll(0, 0, 0, 1);
     bitmap->GetBitmapData(bitmap->GetBitmapRect(), pixels.pixels.data());
+    EXPECT_EQ(pixels.GetColor(31, 31), (Color{0, 0, 0, 255}));
 }
 
 class TraceTest : public testing::Test {
@@ -110,11 +112,14 @@ protected:
 TEST_F(TraceTest, TellsOfEveryThreadTaskFlushTransferAndFileOnce) {
     RenderThreadOptions options;
     options.tracePath = path;
+    options.limits.maxTextureSize = 32;
     std::string error;
     RendererStatistics statistics;
     {
         auto const queue = RenderThread::Start(options, &error);
         ASSERT_TRUE(queue) << error;
+        EXPECT_EQ(queue->GetContextInfo().path, "no driver");
+        EXPECT_EQ(queue->GetContextInfo().maxTextureSize, 32);
         EXPECT_TRUE(Trace::IsOn());
         EXPECT_FALSE(Trace::Start(path + "2", &error));
         EXPECT_THAT(error, AllOf(HasSubstr(path), HasSubstr("stop it first")));
@@ -133,6 +138,9 @@ TEST_F(TraceTest, TellsOfEveryThreadTaskFlushTransferAndFileOnce) {
         queue->WaitForTasks();
         statistics = RendererFactory::GetStatistics();
     }
+    EXPECT_EQ(statistics.drawRequests, 9000u);
+    EXPECT_EQ(statistics.textures + statistics.renderTargets + statistics.graphicsObjects, 0);
+    EXPECT_EQ(statistics.errors, 0u);
     EXPECT_FALSE(Trace::IsOn());
     Events const events(path);
     events.ExpectNested();
@@ -146,7 +154,7 @@ TEST_F(TraceTest, TellsOfEveryThreadTaskFlushTransferAndFileOnce) {
         bool const isSlow = event.at("dur").get<double>() >= 2000;
         EXPECT_TRUE(!isSlow || event.at("args").at("count") <= 8) << event;
     }
-    EXPECT_EQ(events.Sum("renderer", "Flush", "draws"), static_cast<std::int64_t>(statistics.drawRequests));
+    EXPECT_EQ(events.Sum("renderer", "Flush", "draws"), 9000);
     EXPECT_EQ(events.Sum("renderer", "Flush", "runs"), static_cast<std::int64_t>(statistics.draws));
     EXPECT_EQ(events.Sum("renderer", "Upload", "bytes"), 3 * 32 * 32 * 4);
     EXPECT_EQ(events.Sum("renderer", "ReadPixels", "bytes"), 3 * 32 * 32 * 4);
