@@ -10,7 +10,6 @@
 #include "tests/support/LogCapture.h"
 #include "tests/support/TestFiles.h"
 
-#include <cstring>
 #include <gmock/gmock.h>
 #include <memory>
 #include <string>
@@ -31,15 +30,6 @@ constexpr char const* kNotLoaded = "MKBitmapFactory : gDecodeFile Not loaded";
 
 Bytes const kPixels{10, 20, 30, 40, 0, 255, 1, 254}; // two, one over the other
 
-// Loads the bridge where one name is missing.
-int LoadWithout(char const* name) {
-    JNIEnv* const env = JavaMachine::GetMainEnv();
-    PatchedFunctions const missing(env, name);
-    int const result = MKBitmapFactory_OnLoad(JavaMachine::GetVm(), env);
-    EXPECT_FALSE(env->ExceptionCheck()) << name;
-    return result;
-}
-
 class DecodeBridge : public JavaFixture {
 protected:
     void SetUp() override {
@@ -47,11 +37,14 @@ protected:
         mFactory = mEnv->FindClass(kFactory);
         SetResult(nullptr);
         SetThrowing(false);
+        LogCapture const quiet;
+        ASSERT_EQ(LoadWithout("nothing"), 1);
     }
 
-    void Load() {
-        LogCapture const quiet;
-        ASSERT_EQ(MKBitmapFactory_OnLoad(JavaMachine::GetVm(), mEnv), 1);
+    // Loads the bridge where one name is missing.
+    int LoadWithout(char const* name) {
+        PatchedFunctions const missing(mEnv, name);
+        return MKBitmapFactory_OnLoad(JavaMachine::GetVm(), mEnv);
     }
     void SetResult(jobject javaBitmap) {
         jfieldID const field = mEnv->GetStaticFieldID(mFactory, "result", kBitmapType);
@@ -91,6 +84,7 @@ TEST_F(DecodeBridge, SaysWhatIsMissingAndGoesOnWithWhatIsThere) {
         SetResult(javaBitmap);
         LogCapture log;
         EXPECT_EQ(LoadWithout(name), result);
+        EXPECT_FALSE(mEnv->ExceptionCheck());
         std::vector<std::string> expected{kEnter};
         if (message) expected.push_back(message);
         if (result == 1) expected.push_back(kSuccess);
@@ -114,7 +108,6 @@ TEST_F(DecodeBridge, SaysWhatIsMissingAndGoesOnWithWhatIsThere) {
 }
 
 TEST_F(DecodeBridge, WhatJavaCannotReadTheBaseLibraryReads) {
-    Load();
     String const good(mFolder.Path("bridge.webp"));
     ASSERT_TRUE(SaveImage(MakeGradient(3, 2), mFolder.Path("bridge.webp")));
     String const bad("/no/such.png");
@@ -147,7 +140,6 @@ TEST_F(DecodeBridge, WhatJavaCannotReadTheBaseLibraryReads) {
 // On a thread that never returns to Java nobody else would end them. The VM's checks report those that gather, but no
 // frames of them.
 TEST_F(DecodeBridge, GathersNoLocalReferences) {
-    Load();
     LogCapture const quiet;
     String const path("/no/such.jpg");
     static int frames;

@@ -56,7 +56,8 @@ public:
     }
     void Drag(PointF from, PointF to) {
         Add("press", from.x, from.y, 1);
-        for (float t = 0.05f; t < 1.01f; t += 0.05f) {
+        for (int i = 1; i <= 20; ++i) {
+            float const t = static_cast<float>(i) / 20;
             mTime += 4;
             Add("move", std::lround(from.x + (to.x - from.x) * t), std::lround(from.y + (to.y - from.y) * t),
                 1);
@@ -130,9 +131,7 @@ protected:
         }));
         return seen;
     }
-    static Picture GetPagePart(Picture const& window, int rows = kView) {
-        return window.Crop(kEdge, kToolbar, kPage, rows);
-    }
+    static Picture GetPagePart(Picture const& window) { return window.Crop(kEdge, kToolbar, kPage, kView); }
     // Draws the page's file with `moka draw`.
     Picture Draw(std::string const& page) {
         std::string const out = mFolder.Path("drawn.png");

@@ -35,7 +35,6 @@ public:
     }
 
     using TaskQueue::RequestStop;
-    using TaskQueue::Run;
 
 private:
     std::thread mThread;
