@@ -7,6 +7,7 @@
 #include <cerrno>
 #include <cstdarg>
 #include <cstddef>
+#include <cstring>
 #include <fcntl.h>
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
@@ -167,6 +168,7 @@ TEST_P(FileFault, ASaveShowsTheOldFileOrTheWholeNewOne) {
                 EXPECT_EQ(ReadFile() == newBytes, isSaved);
                 EXPECT_EQ(ReadFile() == oldBytes, !isSaved);
                 EXPECT_EQ(mLog.Count(ANDROID_LOG_ERROR), isSaved ? 0 : 1);
+                EXPECT_EQ(mLog.Count(ANDROID_LOG_ERROR, std::strerror(error)), isSaved ? 0 : 1);
                 EXPECT_TRUE(IsAlone());
                 if (!isSaved) ++failures;
             }

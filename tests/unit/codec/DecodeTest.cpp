@@ -32,8 +32,7 @@ std::vector<PngKind> AllKinds() {
 }
 
 void Append(png_structp png, png_bytep data, std::size_t count) {
-    auto* const bytes = static_cast<Bytes*>(png_get_io_ptr(png));
-    bytes->insert(bytes->end(), data, data + count);
+    static_cast<Bytes*>(png_get_io_ptr(png))->append(data, data + count);
 }
 
 void WritePalette(png_structp png, png_infop info, PngKind const& kind, std::mt19937& random) {
@@ -61,14 +60,13 @@ Bytes MakePng(PngKind const& kind, int width, int height) {
         WritePalette(png, info, kind, random);
     else if (kind.hasTransparency)
         png_set_tRNS(png, info, nullptr, 0, &zero);
-    std::vector<Bytes> rows(static_cast<std::size_t>(height), Bytes(png_get_rowbytes(png, info)));
-    std::vector<png_bytep> pointers;
-    for (Bytes& row : rows) {
-        for (unsigned char& byte : row) byte = static_cast<unsigned char>(random() % 2 ? random() : 0);
-        pointers.push_back(row.data());
-    }
+    std::size_t const stride = png_get_rowbytes(png, info);
+    std::vector<png_byte> pixels(static_cast<std::size_t>(height) * stride);
+    for (png_byte& byte : pixels) byte = static_cast<png_byte>(random() % 2 ? random() : 0);
+    std::vector<png_bytep> rows;
+    for (std::size_t at = 0; at < pixels.size(); at += stride) rows.push_back(&pixels[at]);
     png_write_info(png, info);
-    png_write_image(png, pointers.data());
+    png_write_image(png, rows.data());
     png_write_end(png, info);
     png_destroy_write_struct(&png, &info);
     return bytes;
@@ -100,14 +98,14 @@ TEST(PngDecode, EveryColourTypeDepthAndInterlacingBecomesItsExactPixels) {
                                               << " tRNS " << kind.hasTransparency << " side " << side);
             kind.isInterlaced = false;
             Picture const expected = ReadSimply(MakePng(kind, side, 21 - side));
-            WriteBytes(path, MakePng(kind, side, 21 - side));
+            WriteFile(path, MakePng(kind, side, 21 - side));
             EXPECT_EQ(GetInfo(path).hasAlpha,
                       kind.hasTransparency || (kind.colourType & PNG_COLOR_MASK_ALPHA) != 0);
-            EXPECT_TRUE(DecodeFile(path) == expected);
+            EXPECT_TRUE(LoadImage(path) == expected);
             Picture const scaled = DecodeScaled(path, 13, 5);
             kind.isInterlaced = true;
-            WriteBytes(path, MakePng(kind, side, 21 - side));
-            EXPECT_TRUE(DecodeFile(path) == expected);
+            WriteFile(path, MakePng(kind, side, 21 - side));
+            EXPECT_TRUE(LoadImage(path) == expected);
             EXPECT_TRUE(DecodeScaled(path, 13, 5) == scaled);
         }
     }
@@ -115,8 +113,8 @@ TEST(PngDecode, EveryColourTypeDepthAndInterlacingBecomesItsExactPixels) {
 
 // An application segment full of what looks like the end of an image.
 Bytes MakePreviewSegment() {
-    Bytes segment = {0xFF, 0xE1, 0xFF, 0xFD};
-    while (segment.size() < 2 + 0xFFFD) segment.push_back(segment.size() % 2 == 0 ? 0xFF : 0xD9);
+    Bytes segment = "\xFF\xE1\xFF\xFC";
+    while (segment.size() < 2 + 0xFFFC) segment += "\xFF\xD9";
     return segment;
 }
 
@@ -125,11 +123,12 @@ TEST(JpegDecode, EveryColourSpaceAndCodingBecomesOpaqueRgb) {
     Picture const image = MakeGradient(83, 61, true);
     for (int subsampling : {TJSAMP_444, TJSAMP_422, TJSAMP_420, TJSAMP_440, TJSAMP_411}) {
         for (int flags : {0, TJFLAG_PROGRESSIVE}) {
-            Bytes const file = MakeJpeg(image.pixels, 83, 61, TJPF_RGBA, subsampling, flags);
+            Bytes const file = MakeJpeg(image, TJPF_RGBA, subsampling, flags);
             EXPECT_LE(LargestDifference(Decode(file), image), 12) << subsampling << ' ' << flags;
         }
     }
-    EXPECT_EQ(Decode(MakePlainJpeg({77}, TJPF_GRAY, TJSAMP_GRAY)), Fill(16, 16, {77, 77, 77, 255}));
+    EXPECT_EQ(Decode(MakeJpeg(Fill(16, 16, {77, 77, 77, 77}), TJPF_GRAY, TJSAMP_GRAY)),
+              Fill(16, 16, {77, 77, 77, 255}));
 }
 
 TEST(JpegDecode, FourInksMixToRgbByEitherConvention) {
@@ -138,13 +137,12 @@ TEST(JpegDecode, FourInksMixToRgbByEitherConvention) {
         return LargestDifference(Decode(file), Fill(16, 16, color)) <= 4;
     };
     // With Adobe's marker the numbers are light: 255 is no ink. The library codes them as YCCK.
-    Bytes const light = MakePlainJpeg({200, 100, 50, 255}, TJPF_CMYK, TJSAMP_444);
+    Bytes const light = MakeJpeg(Fill(16, 16, {200, 100, 50, 255}), TJPF_CMYK, TJSAMP_444);
     EXPECT_TRUE(isNear(light, {200, 100, 50, 255}));
-    Bytes dark = MakePlainJpeg({240, 240, 240, 128}, TJPF_CMYK, TJSAMP_420);
+    Bytes dark = MakeJpeg(Fill(16, 16, {240, 240, 240, 128}), TJPF_CMYK, TJSAMP_420);
     EXPECT_TRUE(isNear(dark, {120, 120, 120, 255}));
     // Without it the same components (15, 128, 128, 128 in the file) are ink.
-    auto const marker = dark.begin() + static_cast<std::ptrdiff_t>(Find(dark, {0xFF, 0xEE}));
-    dark.erase(marker, marker + 16);
+    dark.erase(dark.find("\xFF\xEE"), 16);
     EXPECT_TRUE(isNear(dark, {120, 63, 63, 255}));
 }
 
@@ -152,11 +150,11 @@ TEST(JpegDecode, LongHeadersAreReadToTheirEndAndPreviewsDoNotCountAsIt) {
     ErrorLines errors;
     TempFolder const folder;
     Picture const image = MakeGradient(40, 30, true);
-    Bytes file = MakeJpeg(image.pixels, 40, 30, TJPF_RGBA, TJSAMP_444);
-    for (int i = 0; i < 12; ++i) file = Insert(file, 2, MakePreviewSegment());
-    WriteBytes(folder.Path("photo.jpg"), file);
+    Bytes file = MakeJpeg(image, TJPF_RGBA, TJSAMP_444);
+    for (int i = 0; i < 12; ++i) file.insert(2, MakePreviewSegment());
+    WriteFile(folder.Path("photo.jpg"), file);
     EXPECT_EQ(GetInfo(folder.Path("photo.jpg")).width, 40);
-    EXPECT_LE(LargestDifference(DecodeFile(folder.Path("photo.jpg")), image), 4);
+    EXPECT_LE(LargestDifference(LoadImage(folder.Path("photo.jpg")), image), 4);
     file.resize(file.size() - 2);
     EXPECT_TRUE(Decode(file).pixels.empty());
     EXPECT_THAT(errors.Take(), ElementsAre(HasSubstr("truncated")));

@@ -67,7 +67,7 @@ TEST(RoundTrip, HonoursAStrideWiderThanTheRow) {
     for (char const* name : {"a.png", "a.webp", "a.mki"}) {
         String const path(folder.Path(name));
         ASSERT_TRUE(BitmapFactory::SaveBitmap(&bitmap, &path, 100));
-        EXPECT_EQ(DecodeFile(folder.Path(name)), wide.Crop(0, 0, 37, 11)) << name;
+        EXPECT_EQ(LoadImage(folder.Path(name)), wide.Crop(0, 0, 37, 11)) << name;
     }
 }
 
@@ -86,9 +86,9 @@ TEST(RoundTrip, ContentDecidesWhenReadingAndTheExtensionWhenWriting) {
         String const text(folder.Path(one.name));
         EXPECT_EQ(BitmapFactory::GetFormatByExtension(&text), one.format) << one.name;
         ASSERT_TRUE(SaveImage(image, folder.Path(one.name)));
-        WriteBytes(folder.Path("misnamed.png"), ReadBytes(folder.Path(one.name)));
+        WriteFile(folder.Path("misnamed.png"), ReadFile(folder.Path(one.name)));
         EXPECT_EQ(GetInfo(folder.Path("misnamed.png")).format, one.format) << one.name;
-        EXPECT_FALSE(DecodeFile(folder.Path("misnamed.png")).pixels.empty());
+        EXPECT_FALSE(LoadImage(folder.Path("misnamed.png")).pixels.empty());
     }
     for (char const* name : {"x.gif", "png", "x.", "x.png/y", "x.pngx", ""}) {
         String const text(name);
