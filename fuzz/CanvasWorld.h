@@ -115,9 +115,4 @@ void DoOne(Steps const& steps, FuzzInput& input, Arguments&... arguments) {
     steps[input.Below(static_cast<int>(std::size(steps)))](arguments...);
 }
 
-using Operation = void (*)(CanvasWorld& world);
-
-// One operation on bitmaps, canvases and drawables, out of the input's next bytes.
-void DoAny(CanvasWorld& world);
-
 } // namespace Moka::Fuzz

@@ -12,6 +12,7 @@
 #include <algorithm>
 #include <cctype>
 #include <filesystem>
+#include <set>
 #include <string>
 #include <unistd.h>
 
@@ -22,33 +23,24 @@ using Scenes::Scene;
 using Scenes::SceneValue;
 
 constexpr double kMostDrawn = 500;
-constexpr double kMostPixels = 1 << 18;
+constexpr double kMostPixels = 1 << 19;
 
-// How often the most repeated value is drawn, or more: every number that can repeat something counts.
-double CountRepetitions(SceneValue const& value) {
+// How often the most repeated value is drawn, or more, and how many pixels the bitmaps have, or more: the numbers of
+// these names multiply what they stand beside.
+std::set<std::string> const kRepetitions{"count", "columns", "rows"};
+std::set<std::string> const kSides{"width", "height"};
+
+double Count(SceneValue const& value, std::set<std::string> const& factors) {
     double own = 1;
     double within = 0;
     for (std::size_t i = 0; i < value.items.size(); ++i) {
-        bool const isNamed = value.kind == SceneValue::Kind::Object;
-        std::string const name = isNamed ? value.keys[i] : std::string();
-        if (name == "count" || name == "columns" || name == "rows")
-            own *= std::max(1.0, value.items[i].number);
-        within += CountRepetitions(value.items[i]);
+        std::string const name = value.keys.empty() ? "" : value.keys[i];
+        if (factors.count(name) > 0) own *= std::max(1.0, value.items[i].number);
+        within += Count(value.items[i], factors);
         // A group repeats what stands beside its "repeat".
-        if (name == "repeat") own *= CountRepetitions(value.items[i]);
+        if (name == "repeat") own *= Count(value.items[i], factors);
     }
     return own * std::max(1.0, within);
-}
-
-double CountPixels(SceneValue const& value) {
-    double sum = 0;
-    double area = 1;
-    for (std::size_t i = 0; i < value.items.size(); ++i) {
-        if (value.kind == SceneValue::Kind::Object && (value.keys[i] == "width" || value.keys[i] == "height"))
-            area *= std::max(1.0, value.items[i].number);
-        sum += CountPixels(value.items[i]);
-    }
-    return sum + area;
 }
 
 void Draw(Scene const& scene, FuzzInput& input) {
@@ -84,8 +76,8 @@ void ReadAndDraw(std::string_view text) {
     FuzzInput nothing(nullptr, 0);
     try {
         SceneValue const root = Scenes::ParseSceneText(text);
-        if (CountPixels(root) > kMostPixels) return;
-        bool const isSmall = CountRepetitions(root) <= kMostDrawn;
+        if (Count(root, kSides) > kMostPixels) return;
+        bool const isSmall = Count(root, kRepetitions) <= kMostDrawn;
         Scene const scene = Scenes::ParseScene(text, "fuzz.json", "no-such-folder");
         if (isSmall) Draw(scene, nothing);
     } catch (Scenes::SceneTextError const&) {
