@@ -18,10 +18,7 @@ constexpr unsigned kWebpAlphaFlag = 0x10;
 Bytef const* DataOf(Bytes const& bytes) { return reinterpret_cast<Bytef const*>(bytes.data()); }
 
 Bytes EmbedInPng(Bytes const& file, Bytes const& profile) {
-    uLongf size = compressBound(profile.size());
-    Bytes packed(size, '\0');
-    compress(reinterpret_cast<Bytef*>(packed.data()), &size, DataOf(profile), profile.size());
-    return PutBeforePixels(file, MakePngChunk("iCCP", "test\0\0"s + packed.substr(0, size)));
+    return PutBeforePixels(file, MakePngChunk("iCCP", "test\0\0"s + Deflate(profile)));
 }
 
 Bytes EmbedInJpeg(Bytes const& file, Bytes const& profile, std::size_t partBytes) {
@@ -54,6 +51,13 @@ Bytes ToLittleEndian(std::uint64_t value, int count) {
 Bytes ToBigEndian(std::uint64_t value, int count) {
     Bytes const bytes = ToLittleEndian(value, count);
     return {bytes.rbegin(), bytes.rend()};
+}
+
+Bytes Deflate(Bytes const& content) {
+    uLongf size = compressBound(content.size());
+    Bytes packed(size, '\0');
+    compress(reinterpret_cast<Bytef*>(packed.data()), &size, DataOf(content), content.size());
+    return packed.substr(0, size);
 }
 
 Bytes ReadProfile(std::string const& name) {

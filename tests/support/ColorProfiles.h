@@ -11,6 +11,7 @@ using Bytes = std::string;
 
 Bytes ToLittleEndian(std::uint64_t value, int count);
 Bytes ToBigEndian(std::uint64_t value, int count);
+Bytes Deflate(Bytes const& content); // as zlib does it
 
 // One of fuzz/corpus/profile: "srgb"; "p3", sRGB's curve and wider primaries; "grey", whose numbers are light; "ink",
 // a table where paper is white, full black ink black and full cyan ink the colour L 50, a -40, b -40.

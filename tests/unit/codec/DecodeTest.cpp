@@ -10,66 +10,44 @@ namespace Moka::Testing {
 namespace {
 
 struct PngKind {
-    int colourType;
+    int type;
     int depth;
-    bool hasTransparency = false; // a tRNS chunk
-    bool isInterlaced = false;
+    bool hasTransparency; // a tRNS chunk
+    bool isInterlaced;
 };
 
-std::vector<PngKind> AllKinds() {
-    std::vector<PngKind> kinds;
-    for (int const type : {PNG_COLOR_TYPE_GRAY, PNG_COLOR_TYPE_PALETTE, PNG_COLOR_TYPE_RGB,
-                           PNG_COLOR_TYPE_GRAY_ALPHA, PNG_COLOR_TYPE_RGBA}) {
-        for (int const depth : {1, 2, 4, 8, 16}) {
-            bool const isSmall = depth < 8;
-            if (type != PNG_COLOR_TYPE_GRAY && depth != 8 && isSmall != (type == PNG_COLOR_TYPE_PALETTE))
-                continue;
-            kinds.push_back({type, depth, false});
-            if (!(type & PNG_COLOR_MASK_ALPHA)) kinds.push_back({type, depth, true});
-        }
-    }
-    return kinds;
-}
-
-void Append(png_structp png, png_bytep data, std::size_t count) {
-    static_cast<Bytes*>(png_get_io_ptr(png))->append(data, data + count);
-}
-
-void WritePalette(png_structp png, png_infop info, PngKind const& kind, std::mt19937& random) {
-    png_color palette[256];
-    png_byte alphas[256];
-    auto const next = [&random] { return static_cast<png_byte>(random()); };
-    for (png_color& colour : palette) colour = {next(), next(), next()};
-    for (png_byte& alpha : alphas) alpha = next();
-    png_set_PLTE(png, info, palette, 1 << kind.depth);
-    if (kind.hasTransparency) png_set_tRNS(png, info, alphas, 1 << kind.depth, nullptr);
-}
+struct Pass {
+    int x, y, stepX, stepY;
+};
+std::vector<Pass> const kWhole{{0, 0, 1, 1}};
+std::vector<Pass> const kAdam7{{0, 0, 8, 8}, {4, 0, 8, 8}, {0, 4, 4, 8}, {2, 0, 4, 4},
+                               {0, 2, 2, 4}, {1, 0, 2, 2}, {0, 1, 1, 2}};
 
 // Of random samples, whatever they mean, many of them zero; the transparent colour, if any, is zero.
 Bytes MakePng(PngKind const& kind, int width, int height) {
-    std::mt19937 random(static_cast<unsigned>(kind.colourType * 100 + kind.depth));
-    Bytes bytes;
-    png_structp png = png_create_write_struct(PNG_LIBPNG_VER_STRING, nullptr, nullptr, nullptr);
-    png_infop info = png_create_info_struct(png);
-    png_set_write_fn(png, &bytes, Append, nullptr);
-    png_set_IHDR(png, info, static_cast<png_uint_32>(width), static_cast<png_uint_32>(height), kind.depth,
-                 kind.colourType, kind.isInterlaced ? PNG_INTERLACE_ADAM7 : PNG_INTERLACE_NONE,
-                 PNG_COMPRESSION_TYPE_DEFAULT, PNG_FILTER_TYPE_DEFAULT);
-    png_color_16 const zero = {};
-    if (kind.colourType == PNG_COLOR_TYPE_PALETTE)
-        WritePalette(png, info, kind, random);
-    else if (kind.hasTransparency)
-        png_set_tRNS(png, info, nullptr, 0, &zero);
-    std::size_t const stride = png_get_rowbytes(png, info);
-    std::vector<png_byte> pixels(static_cast<std::size_t>(height) * stride);
-    for (png_byte& byte : pixels) byte = static_cast<png_byte>(random() % 2 ? random() : 0);
-    std::vector<png_bytep> rows;
-    for (std::size_t at = 0; at < pixels.size(); at += stride) rows.push_back(&pixels[at]);
-    png_write_info(png, info);
-    png_write_image(png, rows.data());
-    png_write_end(png, info);
-    png_destroy_write_struct(&png, &info);
-    return bytes;
+    std::mt19937 random(static_cast<unsigned>(kind.type * 100 + kind.depth));
+    auto const noise = [&random](int count) {
+        Bytes bytes;
+        for (int i = 0; i < count; ++i) bytes += static_cast<char>(random() % 2 ? random() : 0);
+        return bytes;
+    };
+    constexpr int kChannels[] = {1, 0, 3, 1, 2, 0, 4}; // of each type
+    Bytes rows;
+    for (Pass const& pass : kind.isInterlaced ? kAdam7 : kWhole) {
+        int const columns = (width - pass.x + pass.stepX - 1) / pass.stepX;
+        for (int y = pass.y; y < height && columns > 0; y += pass.stepY)
+            rows += '\0' + noise((columns * kChannels[kind.type] * kind.depth + 7) / 8);
+    }
+    Bytes const header = ToBigEndian(static_cast<unsigned>(width), 4) +
+                         ToBigEndian(static_cast<unsigned>(height), 4) + static_cast<char>(kind.depth) +
+                         static_cast<char>(kind.type) + '\0' + '\0' + static_cast<char>(kind.isInterlaced);
+    Bytes file = "\x89PNG\r\n\x1A\n" + MakePngChunk("IHDR", header);
+    bool const hasPalette = kind.type == PNG_COLOR_TYPE_PALETTE;
+    if (hasPalette) file += MakePngChunk("PLTE", noise(3 << kind.depth));
+    if (kind.hasTransparency)
+        file += MakePngChunk("tRNS",
+                             hasPalette ? noise(1 << kind.depth) : Bytes(kChannels[kind.type] * 2U, '\0'));
+    return file + MakePngChunk("IDAT", Deflate(rows)) + MakePngChunk("IEND", "");
 }
 
 // As libpng's simple interface reads it, which takes none of the decoder's decisions, premultiplied here.
@@ -88,27 +66,37 @@ Picture ReadSimply(Bytes const& file) {
     return image;
 }
 
-TEST(PngDecode, EveryColourTypeDepthAndInterlacingBecomesItsExactPixels) {
-    ErrorLines const errors;
+void ExpectExactPixels(PngKind const& kind) {
     TempFolder const folder;
     std::string const path = folder.Path("a.png");
-    for (PngKind kind : AllKinds()) {
-        for (int const side : {2, 3, 19}) {
-            SCOPED_TRACE(::testing::Message() << "type " << kind.colourType << " depth " << kind.depth
-                                              << " tRNS " << kind.hasTransparency << " side " << side);
-            kind.isInterlaced = false;
-            Picture const expected = ReadSimply(MakePng(kind, side, 21 - side));
-            WriteFile(path, MakePng(kind, side, 21 - side));
-            EXPECT_EQ(GetInfo(path).hasAlpha,
-                      kind.hasTransparency || (kind.colourType & PNG_COLOR_MASK_ALPHA) != 0);
-            EXPECT_TRUE(LoadImage(path) == expected);
-            Picture const scaled = DecodeScaled(path, 13, 5);
-            kind.isInterlaced = true;
-            WriteFile(path, MakePng(kind, side, 21 - side));
-            EXPECT_TRUE(LoadImage(path) == expected);
-            EXPECT_TRUE(DecodeScaled(path, 13, 5) == scaled);
-        }
+    // Of interlaced images of 16 bits that lack a pass, the simple interface returns some pixels twice.
+    bool const isSimple = kind.depth < 16 || !kind.isInterlaced;
+    for (int const side : isSimple ? std::vector<int>{2, 3, 19} : std::vector<int>{19}) {
+        SCOPED_TRACE(::testing::Message()
+                     << "type " << kind.type << " depth " << kind.depth << " tRNS " << kind.hasTransparency
+                     << " interlaced " << kind.isInterlaced << " side " << side);
+        Bytes const file = MakePng(kind, side, 21 - side);
+        WriteFile(path, file);
+        Picture const expected = ReadSimply(file);
+        EXPECT_EQ(GetInfo(path).hasAlpha, kind.hasTransparency || (kind.type & PNG_COLOR_MASK_ALPHA) != 0);
+        EXPECT_TRUE(LoadImage(path) == expected);
+        EXPECT_TRUE(DecodeScaled(path, 13, 5) == Scale(expected, 13, 5));
     }
+}
+
+TEST(PngDecode, EveryColourTypeDepthAndInterlacingBecomesItsExactPixels) {
+    ErrorLines const errors;
+    std::pair<int, std::vector<int>> const depths[] = {{PNG_COLOR_TYPE_GRAY, {1, 2, 4, 8, 16}},
+                                                       {PNG_COLOR_TYPE_PALETTE, {1, 2, 4, 8}},
+                                                       {PNG_COLOR_TYPE_RGB, {8, 16}},
+                                                       {PNG_COLOR_TYPE_GRAY_ALPHA, {8, 16}},
+                                                       {PNG_COLOR_TYPE_RGBA, {8, 16}}};
+    for (auto const& [type, ofType] : depths)
+        for (int const depth : ofType)
+            for (bool const hasTransparency : {false, true})
+                for (bool const isInterlaced : {false, true})
+                    if (!hasTransparency || !(type & PNG_COLOR_MASK_ALPHA))
+                        ExpectExactPixels({type, depth, hasTransparency, isInterlaced});
 }
 
 // An application segment full of what looks like the end of an image.
