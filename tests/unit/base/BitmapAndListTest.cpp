@@ -8,7 +8,7 @@
 #include <algorithm>
 #include <deque>
 #include <limits>
-#include <memory>
+#include <numeric>
 #include <random>
 #include <vector>
 
@@ -81,26 +81,21 @@ TEST(ListTest, AQueueInSteadyUseKeepsItsStorageAndDrainsWithoutAllocating) {
     EXPECT_EQ(Testing::GetAllocationCount(), warm);
 }
 
-unsigned char* NewPixels(int bytes) {
-    auto* const pixels = new unsigned char[static_cast<std::size_t>(bytes)];
-    for (int i = 0; i < bytes; ++i) pixels[i] = static_cast<unsigned char>(i);
-    return pixels;
-}
-
 TEST(BitmapTest, CopyIsOwnedAndTightAndLeavesTheSourceToTheCaller) {
     // Two rows at stride 12; the buffer ends with the last pixel, not with a whole stride.
-    std::unique_ptr<unsigned char[]> const pixels(NewPixels(12 + 8));
+    std::vector<unsigned char> pixels(12 + 8);
+    std::iota(pixels.begin(), pixels.end(), static_cast<unsigned char>(0));
     for (bool const deleteBuffer : {false, true}) {
         Bitmap bitmap;
         bool constructed = true;
         {
             Testing::FailAllocations const fail;
-            constructed = bitmap.Construct(pixels.get(), 2, 2, 12, 1, true, deleteBuffer);
+            constructed = bitmap.Construct(pixels.data(), 2, 2, 12, 1, true, deleteBuffer);
         }
         EXPECT_FALSE(constructed) << "no memory for a copy";
-        ASSERT_TRUE(bitmap.Construct(pixels.get(), 2, 2, 12, 1, true, deleteBuffer));
+        ASSERT_TRUE(bitmap.Construct(pixels.data(), 2, 2, 12, 1, true, deleteBuffer));
         unsigned char const* const copy = bitmap.GetBuffer();
-        ASSERT_NE(copy, pixels.get());
+        ASSERT_NE(copy, pixels.data());
         EXPECT_EQ(bitmap.GetStride(), 8);
         EXPECT_TRUE(bitmap.GetDeleteBuffer());
         EXPECT_EQ(std::vector<unsigned char>(copy, copy + 16),
@@ -109,7 +104,7 @@ TEST(BitmapTest, CopyIsOwnedAndTightAndLeavesTheSourceToTheCaller) {
 }
 
 TEST(BitmapTest, RefusesBadArgumentsAndStaysUsable) {
-    std::unique_ptr<unsigned char[]> const pixels(NewPixels(16));
+    std::vector<unsigned char> pixels(16);
     struct Case {
         int width, height, stride, format;
     };
@@ -119,12 +114,12 @@ TEST(BitmapTest, RefusesBadArgumentsAndStaysUsable) {
     for (Case const& c : {Case{0, 2, 8, 1}, Case{2, 0, 8, 1}, Case{-2, 2, 8, 1}, Case{2, -2, 8, 1},
                           Case{2, 2, 7, 1}, Case{2, 2, -8, 1}, Case{2, 2, 8, 0}, Case{2, 2, 8, 2},
                           Case{1 << 30, 1, 0, 1}, Case{max, 1, max, 1}}) {
-        EXPECT_FALSE(bitmap.Construct(pixels.get(), c.width, c.height, c.stride, c.format, false, true))
+        EXPECT_FALSE(bitmap.Construct(pixels.data(), c.width, c.height, c.stride, c.format, false, true))
             << c.width << 'x' << c.height << " stride " << c.stride << " format " << c.format;
         EXPECT_EQ(bitmap.GetBuffer(), nullptr);
     }
-    ASSERT_TRUE(bitmap.Construct(pixels.get(), 2, 2, 8, 1, false, false));
-    EXPECT_FALSE(bitmap.Construct(pixels.get(), 1, 1, 4, 1, false, true)) << "has pixels already";
+    ASSERT_TRUE(bitmap.Construct(pixels.data(), 2, 2, 8, 1, false, false));
+    EXPECT_FALSE(bitmap.Construct(pixels.data(), 1, 1, 4, 1, false, true)) << "has pixels already";
     EXPECT_EQ(bitmap.GetWidth(), 2);
     EXPECT_FALSE(bitmap.GetDeleteBuffer());
 }

@@ -96,6 +96,32 @@ protected:
         return calls;
     }
 
+    // What every bitmap can do, and its answers.
+    static Calls<IMKBitmap> OfABitmap(std::vector<std::string>& answers) {
+        auto const tell = [&](auto const& answer) { answers.push_back(::testing::PrintToString(answer)); };
+        auto const read = std::make_shared<Pixels>(6 * 5 * 4);
+        auto const seen = std::make_shared<Seen>();
+        return {
+            [=](auto& o) { tell(o.GetPixel(Point(1, 2))); },
+            [=](auto& o) { o.GetPixelAsync(Point(3, 4), seen.get(), Seen::OnPixel); },
+            [=](auto& o) { o.GetBitmapDataAsync(Rect(0, 0, 6, 4), read->data(), seen.get(), Seen::OnData); },
+            [=](auto& o) {
+                o.GetBitmapData(Rect(0, 0, 6, 5), read->data());
+                tell(std::make_tuple(*read, seen->pixel, seen->rect));
+            },
+            [=](auto& o) { tell(o.GetX()); },
+            [=](auto& o) { tell(o.GetY()); },
+            [=](auto& o) { tell(o.GetWidth()); },
+            [=](auto& o) { tell(o.GetHeight()); },
+            [=](auto& o) { tell(o.GetBitmapRect()); },
+            [=](auto& o) { tell(BitmapPtr::Adopt(o.Clone())->GetBitmapRect()); },
+            [=](auto& o) { tell(o.GetBitmapReadable()); },
+            [=](auto& o) { tell(o.GetBitmapWritable()); },
+            [=](auto& o) { tell(o.GetBitmapCanvasAttachable()); },
+            [=](auto& o) { tell(o.GetTextureBitmap()); },
+        };
+    }
+
     FakeDrawable drawable;
     Fuzz::FuzzInput input{nullptr, 0};
 };
@@ -146,51 +172,21 @@ TEST_F(Checkers, APenCanvasAnswersTheSameThroughOne) {
 
 TEST_F(Checkers, ABitmapAnswersTheSameThroughOne) {
     Pixels const pixels = UniquePixels(6, 5);
-    auto const bitmap = NewBitmap(6, 5, pixels.data());
-    MKBitmapChecker checker(bitmap.Get());
-    Pixels read(pixels.size());
-    Seen pixel;
-    Seen data;
-    EXPECT_EQ(checker.GetPixel(Point(1, 2)), PixelAt(pixels, 6, 1, 2));
-    checker.GetPixelAsync(Point(3, 4), &pixel, Seen::OnPixel);
-    checker.GetBitmapDataAsync(Rect(0, 0, 6, 4), read.data(), &data, Seen::OnData);
-    checker.GetBitmapData(Rect(0, 0, 6, 5), read.data());
-    EXPECT_EQ(pixel.pixel, PixelAt(pixels, 6, 3, 4));
-    EXPECT_EQ(data.rect, Rect(0, 0, 6, 4));
-    EXPECT_EQ(read, pixels);
-    EXPECT_EQ(BitmapPtr::Adopt(checker.Clone())->GetBitmapRect(), Rect(0, 0, 6, 5));
-    EXPECT_EQ(checker.GetBitmapReadable(), bitmap->GetBitmapReadable());
-    EXPECT_EQ(checker.GetBitmapWritable(), bitmap->GetBitmapWritable());
-    EXPECT_EQ(checker.GetBitmapCanvasAttachable(), bitmap->GetBitmapCanvasAttachable());
-    EXPECT_EQ(checker.GetTextureBitmap(), bitmap->GetTextureBitmap());
     auto const screen = BitmapPtr::Adopt(MKGraphicsFactory::CreateScreenBitmap(&queue, 1, 2, 3, 4, 1, 1));
-    MKBitmapChecker onScreen(screen.Get());
-    EXPECT_THAT(
-        (std::vector<int>{onScreen.GetX(), onScreen.GetY(), onScreen.GetWidth(), onScreen.GetHeight()}),
-        ElementsAre(1, 2, 3, 4));
+    for (BitmapPtr const& bitmap : {NewBitmap(6, 5, pixels.data()), screen}) {
+        std::vector<std::string> direct, through;
+        MKBitmapChecker checker(bitmap.Get());
+        for (auto const& ask : OfABitmap(direct)) ask(*bitmap);
+        for (auto const& ask : OfABitmap(through)) ask(checker);
+        EXPECT_EQ(through, direct);
+    }
     queue.RunAll();
 }
 
 TEST_F(Checkers, RefuseEveryOperationAfterTheLastUnref) {
     MKBitmapChecker bitmap(target.Get());
-    ExpectRefused<MKBitmapChecker, IMKBitmap>(
-        bitmap, target.Get(), "Bitmap",
-        {
-            [](auto& o) { o.GetPixel({}); },
-            [](auto& o) { o.GetPixelAsync({}, nullptr, nullptr); },
-            [](auto& o) { o.GetBitmapData({}, nullptr); },
-            [](auto& o) { o.GetBitmapDataAsync({}, nullptr, nullptr, nullptr); },
-            [](auto& o) { o.GetX(); },
-            [](auto& o) { o.GetY(); },
-            [](auto& o) { o.GetWidth(); },
-            [](auto& o) { o.GetHeight(); },
-            [](auto& o) { o.GetBitmapRect(); },
-            [](auto& o) { o.Clone(); },
-            [](auto& o) { o.GetBitmapReadable(); },
-            [](auto& o) { o.GetBitmapWritable(); },
-            [](auto& o) { o.GetBitmapCanvasAttachable(); },
-            [](auto& o) { o.GetTextureBitmap(); },
-        });
+    std::vector<std::string> none;
+    ExpectRefused<MKBitmapChecker, IMKBitmap>(bitmap, target.Get(), "Bitmap", OfABitmap(none));
     MKCanvasChecker plain(canvas.Get());
     ExpectRefused(plain, canvas.Get(), "Canvas", OfACanvas());
     auto const pen = NewPenCanvas(target);

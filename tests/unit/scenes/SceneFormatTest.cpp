@@ -188,8 +188,6 @@ TEST_F(SceneFormat, AMistakeInAnOperationIsNamedWithItsPlace) {
          "6:11: operations[1].DrawCircle.raduis is unknown; there are cx, cy, radius, paint"},
         {"{\"Save\": {}},\n\n{\"DrawCircel\": {}}",
          "6:16: operations[1].DrawCircel is no operation; there are Group, DrawBitmap"},
-        {R"({"Save": {"flag": "SaveSome"}})",
-         "4:19: operations[0].Save.flag must be one of SaveAll, SaveMatrix, SaveClip or its number"},
         {"{\"DrawRect\": {\"rect\": [1, 2,\n3, null]}}",
          "5:4: operations[0].DrawRect.rect[3] must be a number, not null"},
         {"{\"DrawRect\": {\"rect\": [1, 2, 3, 4],\n\"paint\": {\"xfermode\": \"Multiply\"}}}",
@@ -200,8 +198,6 @@ TEST_F(SceneFormat, AMistakeInAnOperationIsNamedWithItsPlace) {
          "4:32: operations[0].DrawSimpleLines.points must be an even number of points"},
         {R"({"SetClipRect": {"x": 0.5, "y": 1, "width": 2, "height": 3}})",
          "4:23: operations[0].SetClipRect.x must be a whole number, not 0.5"},
-        {R"({"Group": {"repeat": {"count": 0}, "operations": []}})",
-         "4:32: operations[0].Group.repeat.count must be a whole number from 1 to 100000, not 0"},
         {"{\"Group\": {\"operations\": [\n{\"Group\": {\"operations\": [\n{\"Draw\": {}}]}}]}}",
          "6:10: operations[0].Group.operations[0].Group.operations[0].Draw is no operation"},
     };
