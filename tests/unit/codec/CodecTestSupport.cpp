@@ -5,7 +5,6 @@
 
 #include <cmath>
 #include <memory>
-#include <random>
 #include <turbojpeg.h>
 
 namespace Moka::Testing {
@@ -27,21 +26,7 @@ Picture Fill(int width, int height, Color const& color) {
     return MakeChecker(width, height, 1, color, color);
 }
 
-Picture MakeTranslucentNoise(int width, int height, unsigned seed) {
-    std::mt19937 random(seed);
-    Picture image(width, height);
-    for (std::size_t i = 0; i < image.pixels.size(); i += 4) {
-        unsigned const alpha = random() % 256;
-        for (std::size_t c = 0; c < 3; ++c)
-            image.pixels[i + c] = static_cast<unsigned char>(random() % (alpha + 1));
-        image.pixels[i + 3] = static_cast<unsigned char>(alpha);
-    }
-    return image;
-}
-
-Picture MakeOpaqueNoise(int width, int height) {
-    return FlattenOnWhite(MakeTranslucentNoise(width, height, 1));
-}
+Picture MakeOpaquePattern(int width, int height) { return FlattenOnWhite(MakeAlphaPattern(width, height)); }
 
 Picture MakeGradient(int width, int height, bool isOpaque) {
     Picture image(width, height);

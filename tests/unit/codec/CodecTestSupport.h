@@ -19,9 +19,8 @@ using ::testing::HasSubstr;
 
 // Every pixel the same.
 Picture Fill(int width, int height, Color const& color);
-// Every alpha occurs, and colours from 0 up to it.
-Picture MakeTranslucentNoise(int width, int height, unsigned seed = 1);
-Picture MakeOpaqueNoise(int width, int height);
+// MakeAlphaPattern on white.
+Picture MakeOpaquePattern(int width, int height);
 // Smooth, so that lossy codecs come close.
 Picture MakeGradient(int width, int height, bool isOpaque);
 Picture FlattenOnWhite(Picture image);

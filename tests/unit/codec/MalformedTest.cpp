@@ -44,7 +44,7 @@ protected:
 
 // With checksums wrong pixels are never shown, and no header is believed that is not the one written.
 TEST_F(Malformed, EveryCutIsRefusedAndEveryChangedByteToo) {
-    Picture const image = MakeTranslucentNoise(7, 5);
+    Picture const image = MakeAlphaPattern(7, 5);
     for (Kind const& kind : kKinds) {
         Bytes const file = Encode(image, kind.extension, kind.quality);
         for (std::size_t i = 0; i < file.size(); ++i) {
@@ -65,13 +65,13 @@ TEST_F(Malformed, EveryCutIsRefusedAndEveryChangedByteToo) {
 }
 
 Bytes MakePngHeader(std::uint32_t width, std::uint32_t height) {
-    Bytes const file = Encode(MakeOpaqueNoise(4, 4), "png");
+    Bytes const file = Encode(MakeOpaquePattern(4, 4), "png");
     Bytes const size = ToBigEndian(width, 4) + ToBigEndian(height, 4);
     return file.substr(0, 8) + MakePngChunk("IHDR", size + file.substr(24, 5)) + file.substr(33);
 }
 
 TEST_F(Malformed, ClaimsOutsideTheLimitsAreRefusedBeforeAnythingIsAllocated) {
-    Bytes const jpeg = Encode(MakeOpaqueNoise(8, 8), "jpg", 80);
+    Bytes const jpeg = Encode(MakeOpaquePattern(8, 8), "jpg", 80);
     auto const withSides = [&](unsigned height, unsigned width) {
         return Bytes(jpeg).replace(jpeg.find("\xFF\xC0") + 5, 4,
                                    ToBigEndian(height, 2) + ToBigEndian(width, 2));
@@ -106,7 +106,7 @@ TEST_F(Malformed, WhatIsNoImageFileIsRefusedByEveryReader) {
     WriteFile(folder.Path("empty.png"), {});
     WriteFile(folder.Path("text.png"), "hello");
     ASSERT_EQ(mkfifo(folder.Path("pipe.png").c_str(), 0600), 0);
-    WriteFile(folder.Path("large.png"), Encode(MakeOpaqueNoise(4, 4), "png"));
+    WriteFile(folder.Path("large.png"), Encode(MakeOpaquePattern(4, 4), "png"));
     ASSERT_EQ(truncate(folder.Path("large.png").c_str(), off_t{1} << 31), 0); // sparse
     struct {
         std::string path;
@@ -170,7 +170,7 @@ Bytes Compress(Bytes const& content, int level = 1, bool hasChecksum = true, boo
 
 TEST(Mki, ReadsFilesThatItDidNotWrite) {
     ErrorLines const errors;
-    Picture const image = MakeTranslucentNoise(3, 2);
+    Picture const image = MakeAlphaPattern(3, 2);
     for (int const level : {1, 19})
         EXPECT_EQ(Decode(MakeMki({3, 2}, Compress(PixelsOf(image), level))), image);
     EXPECT_EQ(Decode(MakeMki({3, 2, 1, 0}, PixelsOf(image))), image) << "stored";
@@ -179,7 +179,7 @@ TEST(Mki, ReadsFilesThatItDidNotWrite) {
 }
 
 TEST(Mki, RefusesWhateverDoesNotAddUp) {
-    Bytes const pixels = PixelsOf(MakeTranslucentNoise(3, 2));
+    Bytes const pixels = PixelsOf(MakeAlphaPattern(3, 2));
     Bytes const frame = Compress(pixels);
     Bytes const longer(28, '\1');
     Bytes badCheck = frame;

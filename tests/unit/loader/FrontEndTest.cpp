@@ -17,8 +17,6 @@ protected:
         MKBitmapLoader::WaitForAllSaveRequestsToEnd(queue.get());
         MKBitmapLoader::WaitUntilMsgQueueRequired();
     }
-
-    RecordingListener listener;
 };
 
 // kind is the class's name, which is in every line of it.
@@ -103,8 +101,6 @@ TEST_F(FrontEnd, BitmapsAreSavedAndTheLoaderFreesACpuBitmapsPixels) {
     BitmapLoader cpu("cpu", &onCpu);
     {
         auto const gpuBitmap = MakeBitmap(image);
-        // While the render thread reads the tag.
-        for (int i = 0; i < 100; ++i) gpuBitmap->SetTag(i % 2 == 0 ? "a page" : "another one");
         EXPECT_TRUE(graphics.RequestSave(1, Path("g.png"), *gpuBitmap, nullptr, 100));
         Bitmap cpuBitmap;
         cpuBitmap.Construct(NewPixels(image), 20, 10, 80, 1, false, true);
