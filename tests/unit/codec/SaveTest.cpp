@@ -6,12 +6,6 @@
 namespace Moka::Testing {
 namespace {
 
-mode_t ModeOf(std::string const& path) {
-    struct stat status = {};
-    EXPECT_EQ(stat(path.c_str(), &status), 0) << path;
-    return status.st_mode & 07777;
-}
-
 TEST(Save, TargetsThatAreNoImageFilesAreRefusedWithTheReason) {
     ErrorLines errors;
     TempFolder const folder;
@@ -62,11 +56,11 @@ TEST(Save, ANewFileObeysTheMaskAndAReplacedOneKeepsItsMode) {
     mode_t const mask = umask(027);
     EXPECT_TRUE(SaveImage(image, folder.Path("new.png")));
     umask(mask);
-    EXPECT_EQ(ModeOf(folder.Path("new.png")), 0640u);
+    EXPECT_EQ(std::filesystem::status(folder.Path("new.png")).permissions(), std::filesystem::perms(0640));
     WriteFile(folder.Path("old.png"), "old");
     ASSERT_EQ(chmod(folder.Path("old.png").c_str(), 0604), 0);
     EXPECT_TRUE(SaveImage(image, folder.Path("old.png")));
-    EXPECT_EQ(ModeOf(folder.Path("old.png")), 0604u);
+    EXPECT_EQ(std::filesystem::status(folder.Path("old.png")).permissions(), std::filesystem::perms(0604));
     EXPECT_EQ(LoadImage(folder.Path("old.png")), image);
 }
 
