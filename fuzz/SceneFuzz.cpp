@@ -8,13 +8,12 @@
 #include "scenes/SceneRecorder.h"
 #include "scenes/SceneRenderer.h"
 #include "scenes/SceneText.h"
+#include "tests/support/TestFiles.h"
 
 #include <algorithm>
 #include <cctype>
-#include <filesystem>
 #include <set>
 #include <string>
-#include <unistd.h>
 
 namespace Moka::Fuzz {
 namespace {
@@ -51,10 +50,8 @@ void Draw(Scene const& scene, FuzzInput& input) {
                                         std::min(scene.height, kMaxSide), nullptr, false, 1, false));
     auto const canvas =
         RefPtr<IMKCanvas>::Adopt(MKGraphicsFactory::CreateCanvas(&world.queue, target.Get(), 1));
-    static std::filesystem::path const folder =
-        std::filesystem::temp_directory_path() / ("moka-recording-" + std::to_string(getpid()));
-    std::filesystem::create_directory(folder);
-    std::string const path = folder / "scene.json";
+    Testing::TempFolder const folder;
+    std::string const path = folder.Path("scene.json");
     auto const recorder = Scenes::SceneRecorder::Start(path, *canvas);
     Require(static_cast<bool>(recorder), "no recorder");
     Scenes::DrawScene(scene, *recorder, stage);
@@ -63,7 +60,6 @@ void Draw(Scene const& scene, FuzzInput& input) {
     } catch (Scenes::SceneError const& error) {
         Require(false, error.what());
     }
-    std::filesystem::remove_all(folder);
 }
 
 void RequireMessage(std::string const& text) {

@@ -26,8 +26,6 @@ Picture Fill(int width, int height, Color const& color) {
     return MakeChecker(width, height, 1, color, color);
 }
 
-Picture MakeOpaquePattern(int width, int height) { return FlattenOnWhite(MakeAlphaPattern(width, height)); }
-
 Picture MakeGradient(int width, int height, bool isOpaque) {
     Picture image(width, height);
     std::size_t i = 0;

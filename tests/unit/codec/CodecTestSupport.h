@@ -19,8 +19,6 @@ using ::testing::HasSubstr;
 
 // Every pixel the same.
 Picture Fill(int width, int height, Color const& color);
-// MakeAlphaPattern on white.
-Picture MakeOpaquePattern(int width, int height);
 // Smooth, so that lossy codecs come close.
 Picture MakeGradient(int width, int height, bool isOpaque);
 Picture FlattenOnWhite(Picture image);

@@ -166,7 +166,7 @@ TEST(Animation, TheFirstFrameOfAWebpIsDecodedWhereItLies) {
     TempFolder const folder;
     Picture const frame = MakeAlphaPattern(10, 6);
     Bytes const head = MakeWebpChunk("ANIM", Bytes("\xFF\xFF\xFF\xFF\0", 6));
-    Bytes const second = MakeFrame(MakeOpaquePattern(20, 12), 0, 0);
+    Bytes const second = MakeFrame(MakeGradient(20, 12), 0, 0);
     Bytes const file = MakeWebpFile(0x12, 20, 12, head + MakeFrame(frame, 4, 2) + second);
     Picture const expected = Picture(20, 12).With(4, 2, frame);
     WriteFile(folder.Path("a.webp"), file);

@@ -65,13 +65,13 @@ TEST_F(Malformed, EveryCutIsRefusedAndEveryChangedByteToo) {
 }
 
 Bytes MakePngHeader(std::uint32_t width, std::uint32_t height) {
-    Bytes const file = Encode(MakeOpaquePattern(4, 4), "png");
+    Bytes const file = Encode(MakeGradient(4, 4), "png");
     Bytes const size = ToBigEndian(width, 4) + ToBigEndian(height, 4);
     return file.substr(0, 8) + MakePngChunk("IHDR", size + file.substr(24, 5)) + file.substr(33);
 }
 
 TEST_F(Malformed, ClaimsOutsideTheLimitsAreRefusedBeforeAnythingIsAllocated) {
-    Bytes const jpeg = Encode(MakeOpaquePattern(8, 8), "jpg", 80);
+    Bytes const jpeg = Encode(MakeGradient(8, 8), "jpg", 80);
     auto const withSides = [&](unsigned height, unsigned width) {
         return Bytes(jpeg).replace(jpeg.find("\xFF\xC0") + 5, 4,
                                    ToBigEndian(height, 2) + ToBigEndian(width, 2));
@@ -106,7 +106,7 @@ TEST_F(Malformed, WhatIsNoImageFileIsRefusedByEveryReader) {
     WriteFile(folder.Path("empty.png"), {});
     WriteFile(folder.Path("text.png"), "hello");
     ASSERT_EQ(mkfifo(folder.Path("pipe.png").c_str(), 0600), 0);
-    WriteFile(folder.Path("large.png"), Encode(MakeOpaquePattern(4, 4), "png"));
+    WriteFile(folder.Path("large.png"), Encode(MakeGradient(4, 4), "png"));
     ASSERT_EQ(truncate(folder.Path("large.png").c_str(), off_t{1} << 31), 0); // sparse
     struct {
         std::string path;

@@ -26,7 +26,7 @@ TEST(Save, TargetsThatAreNoImageFilesAreRefusedWithTheReason) {
         {folder.Path("page"), "unknown extension ''"},
     };
     for (auto const& one : cases) {
-        EXPECT_FALSE(SaveImage(MakeOpaquePattern(3, 3), one.path)) << one.path;
+        EXPECT_FALSE(SaveImage(MakeGradient(3, 3), one.path)) << one.path;
         EXPECT_THAT(errors.Take(), ElementsAre(HasSubstr(one.reason)));
     }
     EXPECT_EQ(folder.List(), before);
@@ -52,7 +52,7 @@ TEST(Save, ImagesThatAFormatCannotHoldAreRefused) {
 
 TEST(Save, ANewFileObeysTheMaskAndAReplacedOneKeepsItsMode) {
     TempFolder const folder;
-    Picture const image = MakeOpaquePattern(5, 5);
+    Picture const image = MakeGradient(5, 5);
     mode_t const mask = umask(027);
     EXPECT_TRUE(SaveImage(image, folder.Path("new.png")));
     umask(mask);

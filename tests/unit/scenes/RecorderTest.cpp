@@ -40,10 +40,13 @@ protected:
         return ReadFile(path);
     }
 
-    // Of a scene without bitmaps.
-    static void Draw(Scene const& scene, IMKCanvas& canvas) {
-        ReferenceStage stage;
-        scene.draw(canvas, stage);
+    // What drawing the recording, which has no bitmaps, puts onto another one.
+    std::string RecordAgain() {
+        Scene const scene = Scenes::LoadScene(path);
+        return Record([&](IMKCanvas& canvas) {
+            ReferenceStage stage;
+            scene.draw(canvas, stage);
+        });
     }
 
     LogCapture log;
@@ -81,8 +84,7 @@ TEST_F(SceneRecorderTest, EveryNumberIsReadAsTheSameOne) {
             canvas.SetClipRect(i, -i, 1 << i % 31, 3, static_cast<IMKCanvasBase::ClipOp>(i % 9));
         }
     });
-    Scene const scene = Scenes::LoadScene(path);
-    EXPECT_EQ(Record([&](IMKCanvas& canvas) { Draw(scene, canvas); }), first);
+    EXPECT_EQ(RecordAgain(), first);
 }
 
 TEST_F(SceneRecorderTest, WhatNoSceneCanSayIsNamedAndTheRestIsThere) {
@@ -108,8 +110,7 @@ TEST_F(SceneRecorderTest, WhatNoSceneCanSayIsNamedAndTheRestIsThere) {
     EXPECT_THAT(text, HasSubstr(R"({"LeftOut": {"what": "DrawCircle with a number that is not finite"}})"));
     EXPECT_THAT(text, HasSubstr(R"({"LeftOut": {"what": "DrawRect with a number that is not finite"}})"));
     EXPECT_THAT(text, HasSubstr(R"({"points": [[1, 2], [3, 4]]})"));
-    Scene const scene = Scenes::LoadScene(path);
-    EXPECT_EQ(Record([&](IMKCanvas& canvas) { Draw(scene, canvas); }).find("nan"), std::string::npos);
+    EXPECT_EQ(RecordAgain().find("nan"), std::string::npos);
 }
 
 TEST_F(SceneRecorderTest, WhatCannotBeWrittenIsOneLineAndTheDrawingGoesOn) {
