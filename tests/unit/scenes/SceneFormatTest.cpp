@@ -157,34 +157,32 @@ void ExpectNamed(std::vector<Mistake> const& mistakes, bool areOperations) {
 }
 
 TEST_F(SceneFormat, AMistakeInTheFileIsNamedWithItsPlace) {
-    ExpectNamed(
-        {
-            {"", "1:1: this is no JSON: syntax error"},
-            {R"({|"size": [8, 6],|})", "3:1: this is no JSON: syntax error"},
-            {R"({"size": tru|})",
-             "1:13: this is no JSON: syntax error"}, // the line break belongs to its line
-            {R"({|"size": [8, 1e999]})", "2:13: this is no JSON: number overflow"},
-            {R"({||"size": [8, 1e39]})", "3:13: a number is too large"},
-            {std::string(100'000, '['), "1:65: nested more than 64 levels"},
-            {R"({"size": [8, 6],|  "size": [8, 6]})", "2:3: \"size\" is given twice"},
-            {R"({"size": 8})", "1:10: size must be [width, height], not 8"},
-            {R"({"size": [8,|0]})", "2:1: size[1] must be a whole number from 1 to 65535, not 0"},
-            {R"({"size": [16384, 16385]})", "1:10: size: more than 1 GiB of pixels"},
-            {R"({"size": [8, 6], "operations": [],|"backgroud": 1})",
-             "2:14: backgroud is unknown; there are size, about, background, labels, bitmaps, paints, "
-             "operations"},
-            // A column counts characters, and what is in a text is no structure.
-            {"{\"about\": \"\u00e9\\\\\\\"{[,\", \"size\": true}", "1:31: size must be"},
-            {R"({"size": [8, 6],|"bitmaps": {|"a": {"picture": "cat", "width": 1, "height": 1}}})",
-             "3:18: bitmaps.a.picture must be one of gradient, checker"},
-            {R"({"size": [8, 6],|"bitmaps": {"a b": {"picture": "photo",|"width": 1,|"height": 5000}}})",
-             "4:11: bitmaps[\"a b\"].height must be a whole number from 1 to 4096"},
-            {R"({"size": [8, 6],|"bitmaps": {|"a": {|"file": "cat.png"}}})",
-             "4:9: bitmaps.a.file: cannot load the image /nowhere/cat.png"},
-            {R"({"size": [8, 6],|"paints": {"a": {"base": "b"}}})",
-             "2:26: paints.a.base must be described under"},
-        },
-        false);
+    std::vector<Mistake> const mistakes = {
+        {"", "1:1: this is no JSON: syntax error"},
+        {R"({|"size": [8, 6],|})", "3:1: this is no JSON: syntax error"},
+        {R"({"size": tru|})", "1:13: this is no JSON: syntax error"}, // the line break belongs to its line
+        {R"({|"size": [8, 1e999]})", "2:13: this is no JSON: number overflow"},
+        {R"({||"size": [8, 1e39]})", "3:13: a number is too large"},
+        {std::string(100'000, '['), "1:65: nested more than 64 levels"},
+        {R"({"size": [8, 6],|  "size": [8, 6]})", "2:3: \"size\" is given twice"},
+        {R"({"size": 8})", "1:10: size must be [width, height], not 8"},
+        {R"({"size": [8,|0]})", "2:1: size[1] must be a whole number from 1 to 65535, not 0"},
+        {R"({"size": [16384, 16385]})", "1:10: size: more than 1 GiB of pixels"},
+        {R"({"size": [8, 6], "operations": [],|"backgroud": 1})",
+         "2:14: backgroud is unknown; there are size, about, background, labels, bitmaps, paints, "
+         "operations"},
+        // A column counts characters, and what is in a text is no structure.
+        {"{\"about\": \"\u00e9\\\\\\\"{[,\", \"size\": true}", "1:31: size must be"},
+        {R"({"size": [8, 6],|"bitmaps": {|"a": {"picture": "cat", "width": 1, "height": 1}}})",
+         "3:18: bitmaps.a.picture must be one of gradient, checker"},
+        {R"({"size": [8, 6],|"bitmaps": {"a b": {"picture": "photo",|"width": 1,|"height": 5000}}})",
+         "4:11: bitmaps[\"a b\"].height must be a whole number from 1 to 4096"},
+        {R"({"size": [8, 6],|"bitmaps": {|"a": {|"file": "cat.png"}}})",
+         "4:9: bitmaps.a.file: cannot load the image /nowhere/cat.png"},
+        {R"({"size": [8, 6],|"paints": {"a": {"base": "b"}}})",
+         "2:26: paints.a.base must be described under"},
+    };
+    ExpectNamed(mistakes, false);
 }
 
 TEST_F(SceneFormat, AMistakeInAnOperationIsNamedWithItsPlace) {
@@ -192,35 +190,34 @@ TEST_F(SceneFormat, AMistakeInAnOperationIsNamedWithItsPlace) {
     std::string const thousand = R"({"Group": {"repeat": {"count": 1000}, "operations": [)";
     std::string const million = thousand + thousand;
     EXPECT_EQ(FindError(WithOperations(million + R"({"Save": {}}]}}]}})")), "no error");
-    ExpectNamed(
-        {
-            {million + R"({"Save": {}},|{"Save": {}}]}}]}})",
-             "4:1: operations[0]: a scene may have 1000000 operations"},
-            {million + thousand + "]}}]}}]}}",
-             "4:1: operations[0]: a scene may have"}, // even where there is nothing to repeat
-            {R"({"DrawSimpleLines": {"points": {"columns": 2000, "rows": 2000,|"from": [0, 0], "step": [1, 1]}}})",
-             "4:32: operations[0].DrawSimpleLines.points: more than 1000000 places"},
-            {R"({"DrawCircle": {"cx": 1, "cy": 2}})", "4:16: operations[0].DrawCircle needs \"radius\""},
-            {R"({"DrawCircle": {"cx": 1,|"cy": 2, "radius":|"big"}})",
-             "6:1: operations[0].DrawCircle.radius must be a number, not \"big\""},
-            {R"({"Save": {}},|{"DrawCircle": {"cx": 1, "cy": 2, "radius": 3,|"raduis": 3}})",
-             "6:11: operations[1].DrawCircle.raduis is unknown; there are cx, cy, radius, paint"},
-            {R"({"Save": {}},||{"DrawCircel": {}})",
-             "6:16: operations[1].DrawCircel is no operation; there are Group, DrawBitmap"},
-            {R"({"DrawRect": {"rect": [1, 2,|3, null]}})",
-             "5:4: operations[0].DrawRect.rect[3] must be a number, not null"},
-            {R"({"DrawRect": {"rect": [1, 2, 3, 4],|"paint": {"xfermode": "Multiply"}}})",
-             "5:23: operations[0].DrawRect.paint.xfermode must be one of Add, Clear"},
-            {R"({"DrawBitmap": {"bitmap": "a", "x": 1, "y": 2}})",
-             "4:27: operations[0].DrawBitmap.bitmap must be described under \"bitmaps\""},
-            {R"({"DrawSimpleLines": {"points": [[1, 2]]}})",
-             "4:32: operations[0].DrawSimpleLines.points must be an even number of points"},
-            {R"({"SetClipRect": {"x": 0.5, "y": 1, "width": 2, "height": 3}})",
-             "4:23: operations[0].SetClipRect.x must be a whole number, not 0.5"},
-            {R"({"Group": {"operations": [|{"Group": {"operations": [|{"Draw": {}}]}}]}})",
-             "6:10: operations[0].Group.operations[0].Group.operations[0].Draw is no operation"},
-        },
-        true);
+    std::vector<Mistake> const mistakes = {
+        {million + R"({"Save": {}},|{"Save": {}}]}}]}})",
+         "4:1: operations[0]: a scene may have 1000000 operations"},
+        {million + thousand + "]}}]}}]}}",
+         "4:1: operations[0]: a scene may have"}, // even where there is nothing to repeat
+        {R"({"DrawSimpleLines": {"points": {"columns": 2000, "rows": 2000,|"from": [0, 0], "step": [1, 1]}}})",
+         "4:32: operations[0].DrawSimpleLines.points: more than 1000000 places"},
+        {R"({"DrawCircle": {"cx": 1, "cy": 2}})", "4:16: operations[0].DrawCircle needs \"radius\""},
+        {R"({"DrawCircle": {"cx": 1,|"cy": 2, "radius":|"big"}})",
+         "6:1: operations[0].DrawCircle.radius must be a number, not \"big\""},
+        {R"({"Save": {}},|{"DrawCircle": {"cx": 1, "cy": 2, "radius": 3,|"raduis": 3}})",
+         "6:11: operations[1].DrawCircle.raduis is unknown; there are cx, cy, radius, paint"},
+        {R"({"Save": {}},||{"DrawCircel": {}})",
+         "6:16: operations[1].DrawCircel is no operation; there are Group, DrawBitmap"},
+        {R"({"DrawRect": {"rect": [1, 2,|3, null]}})",
+         "5:4: operations[0].DrawRect.rect[3] must be a number, not null"},
+        {R"({"DrawRect": {"rect": [1, 2, 3, 4],|"paint": {"xfermode": "Multiply"}}})",
+         "5:23: operations[0].DrawRect.paint.xfermode must be one of Add, Clear"},
+        {R"({"DrawBitmap": {"bitmap": "a", "x": 1, "y": 2}})",
+         "4:27: operations[0].DrawBitmap.bitmap must be described under \"bitmaps\""},
+        {R"({"DrawSimpleLines": {"points": [[1, 2]]}})",
+         "4:32: operations[0].DrawSimpleLines.points must be an even number of points"},
+        {R"({"SetClipRect": {"x": 0.5, "y": 1, "width": 2, "height": 3}})",
+         "4:23: operations[0].SetClipRect.x must be a whole number, not 0.5"},
+        {R"({"Group": {"operations": [|{"Group": {"operations": [|{"Draw": {}}]}}]}})",
+         "6:10: operations[0].Group.operations[0].Group.operations[0].Draw is no operation"},
+    };
+    ExpectNamed(mistakes, true);
 }
 
 // The limit is one for all of a scene, whether made by rule or read from a file.
