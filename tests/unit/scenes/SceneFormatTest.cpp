@@ -50,6 +50,7 @@ protected:
         Scenes::QueueStage stage(queue);
         DrawScene(scene, *recorder, stage);
         EXPECT_TRUE(recorder->Close());
+        queue.RunAll(); // frees the scene's bitmaps
         return ReadFile(folder.Path("scene.json"));
     }
 
