@@ -58,7 +58,13 @@ struct Slot {
 class CanvasWorld {
 public:
     explicit CanvasWorld(FuzzInput& bytes) : input(bytes) { Testing::RendererTrace::KeepRecords(false); }
-    ~CanvasWorld();
+    ~CanvasWorld() {
+        DropAll();
+        queue.RunAll();
+        for (std::string const& violation : Testing::RendererTrace::GetViolations())
+            Require(false, violation.c_str());
+        Require(Testing::RendererTrace::CountLiveObjects() == 0, "GPU objects are left");
+    }
     CanvasWorld(CanvasWorld const&) = delete;
     CanvasWorld& operator=(CanvasWorld const&) = delete;
 
@@ -79,10 +85,15 @@ public:
     }
 
     // A bitmap that an object of this flavour may use; null when the picked one is of the other.
-    IMKBitmap* PickBitmapFor(bool onRenderThread);
+    IMKBitmap* PickBitmapFor(bool onRenderThread) {
+        Slot<IMKBitmap> const& slot = PickBitmap();
+        return slot.onRenderThread && !onRenderThread ? nullptr : slot.object.Get();
+    }
 
     // Memory that stays until the end, since the queue may read or write it then.
-    unsigned char* NewBuffer(std::size_t count);
+    unsigned char* NewBuffer(std::size_t count) {
+        return mBuffers.emplace_back(std::make_unique<unsigned char[]>(count)).get();
+    }
 
     FuzzInput& input;
     Testing::PumpedRenderer queue{kMaxTexture};
@@ -96,7 +107,19 @@ private:
     Slot<T>& Pick(std::array<Slot<T>, count>& slots) {
         return slots[static_cast<std::size_t>(input.Below(static_cast<int>(count)))];
     }
-    void DropAll();
+    void DropAll() {
+        int const order = input.Byte();
+        auto const drop = [](auto& slots) {
+            for (auto& slot : slots) slot.Drop();
+        };
+        if ((order & 1) != 0) drop(bitmaps);
+        if ((order & 2) != 0) drop(canvases);
+        if ((order & 4) != 0) queue.RunAll();
+        drop(drawables);
+        drop(penCanvases);
+        drop(canvases);
+        drop(bitmaps);
+    }
 
     std::vector<std::unique_ptr<unsigned char[]>> mBuffers;
 };
@@ -114,10 +137,5 @@ template <class Steps, class... Arguments>
 void DoOne(Steps const& steps, FuzzInput& input, Arguments&... arguments) {
     steps[input.Below(static_cast<int>(std::size(steps)))](arguments...);
 }
-
-using Operation = void (*)(CanvasWorld& world);
-
-// One operation on bitmaps, canvases and drawables, out of the input's next bytes.
-void DoAny(CanvasWorld& world);
 
 } // namespace Moka::Fuzz

@@ -26,21 +26,13 @@ constexpr bool kKnowsAlpha = kFormat != ImageFormat::Webp;
 
 using BitmapPtr = std::unique_ptr<Bitmap>;
 
-// A file in memory.
-class MemoryFile {
-public:
-    MemoryFile(std::uint8_t const* data, std::size_t size) : mFile(memfd_create("fuzz", 0)) {
-        Require(mFile >= 0 && write(mFile, data, size) == static_cast<ssize_t>(size), "no file in memory");
-    }
-    ~MemoryFile() { close(mFile); }
-    MemoryFile(MemoryFile const&) = delete;
-    MemoryFile& operator=(MemoryFile const&) = delete;
-
-    String GetPath() const { return String("/proc/self/fd/" + std::to_string(mFile)); }
-
-private:
-    int mFile;
-};
+// The path of a file in memory that holds the bytes until the next call.
+String PutIntoFile(std::uint8_t const* data, std::size_t size) {
+    static int const file = memfd_create("fuzz", 0);
+    Require(ftruncate(file, 0) == 0 && pwrite(file, data, size, 0) == static_cast<ssize_t>(size),
+            "no file in memory");
+    return String("/proc/self/fd/" + std::to_string(file));
+}
 
 std::size_t CountBytes(Bitmap const& bitmap) {
     return static_cast<std::size_t>(bitmap.GetStride()) * static_cast<std::size_t>(bitmap.GetHeight());
@@ -73,8 +65,7 @@ void DecodeScaled(String const& path, bool decodes, bool hasAlpha, int width, in
 }
 
 void DecodeAll(std::uint8_t const* data, std::size_t size) {
-    MemoryFile const file(data, size);
-    String const path = file.GetPath();
+    String const path = PutIntoFile(data, size);
     ImageInfo info;
     bool const hasInfo = BitmapFactory::GetImageInfo(&path, &info);
     if (!hasInfo || info.format != kFormat) return;

@@ -8,12 +8,12 @@
 #include "scenes/SceneRecorder.h"
 #include "scenes/SceneRenderer.h"
 #include "scenes/SceneText.h"
+#include "tests/support/TestFiles.h"
 
 #include <algorithm>
 #include <cctype>
-#include <filesystem>
+#include <set>
 #include <string>
-#include <unistd.h>
 
 namespace Moka::Fuzz {
 namespace {
@@ -22,33 +22,24 @@ using Scenes::Scene;
 using Scenes::SceneValue;
 
 constexpr double kMostDrawn = 500;
-constexpr double kMostPixels = 1 << 18;
+constexpr double kMostPixels = 1 << 19;
 
-// How often the most repeated value is drawn, or more: every number that can repeat something counts.
-double CountRepetitions(SceneValue const& value) {
+// How often the most repeated value is drawn, or more, and how many pixels the bitmaps have, or more: the numbers of
+// these names multiply what they stand beside.
+std::set<std::string> const kRepetitions{"count", "columns", "rows"};
+std::set<std::string> const kSides{"width", "height"};
+
+double Count(SceneValue const& value, std::set<std::string> const& factors) {
     double own = 1;
     double within = 0;
     for (std::size_t i = 0; i < value.items.size(); ++i) {
-        bool const isNamed = value.kind == SceneValue::Kind::Object;
-        std::string const name = isNamed ? value.keys[i] : std::string();
-        if (name == "count" || name == "columns" || name == "rows")
-            own *= std::max(1.0, value.items[i].number);
-        within += CountRepetitions(value.items[i]);
+        std::string const name = value.keys.empty() ? "" : value.keys[i];
+        if (factors.count(name) > 0) own *= std::max(1.0, value.items[i].number);
+        within += Count(value.items[i], factors);
         // A group repeats what stands beside its "repeat".
-        if (name == "repeat") own *= CountRepetitions(value.items[i]);
+        if (name == "repeat") own *= Count(value.items[i], factors);
     }
     return own * std::max(1.0, within);
-}
-
-double CountPixels(SceneValue const& value) {
-    double sum = 0;
-    double area = 1;
-    for (std::size_t i = 0; i < value.items.size(); ++i) {
-        if (value.kind == SceneValue::Kind::Object && (value.keys[i] == "width" || value.keys[i] == "height"))
-            area *= std::max(1.0, value.items[i].number);
-        sum += CountPixels(value.items[i]);
-    }
-    return sum + area;
 }
 
 void Draw(Scene const& scene, FuzzInput& input) {
@@ -59,10 +50,8 @@ void Draw(Scene const& scene, FuzzInput& input) {
                                         std::min(scene.height, kMaxSide), nullptr, false, 1, false));
     auto const canvas =
         RefPtr<IMKCanvas>::Adopt(MKGraphicsFactory::CreateCanvas(&world.queue, target.Get(), 1));
-    static std::filesystem::path const folder =
-        std::filesystem::temp_directory_path() / ("moka-recording-" + std::to_string(getpid()));
-    std::filesystem::create_directory(folder);
-    std::string const path = folder / "scene.json";
+    Testing::TempFolder const folder;
+    std::string const path = folder.Path("scene.json");
     auto const recorder = Scenes::SceneRecorder::Start(path, *canvas);
     Require(static_cast<bool>(recorder), "no recorder");
     Scenes::DrawScene(scene, *recorder, stage);
@@ -71,7 +60,6 @@ void Draw(Scene const& scene, FuzzInput& input) {
     } catch (Scenes::SceneError const& error) {
         Require(false, error.what());
     }
-    std::filesystem::remove_all(folder);
 }
 
 void RequireMessage(std::string const& text) {
@@ -84,8 +72,8 @@ void ReadAndDraw(std::string_view text) {
     FuzzInput nothing(nullptr, 0);
     try {
         SceneValue const root = Scenes::ParseSceneText(text);
-        if (CountPixels(root) > kMostPixels) return;
-        bool const isSmall = CountRepetitions(root) <= kMostDrawn;
+        if (Count(root, kSides) > kMostPixels) return;
+        bool const isSmall = Count(root, kRepetitions) <= kMostDrawn;
         Scene const scene = Scenes::ParseScene(text, "fuzz.json", "no-such-folder");
         if (isSmall) Draw(scene, nothing);
     } catch (Scenes::SceneTextError const&) {

@@ -146,12 +146,10 @@ void DecodeProfiled(benchmark::State& state, char const* extension, char const* 
     String const text(path);
     BitmapFactory::SaveBitmap(&GetBitmap(kPhoto), &text, 100);
     std::ifstream plain(path, std::ios::binary);
-    Moka::Testing::FileBytes const bytes(std::istreambuf_iterator<char>(plain), {});
+    std::string const bytes(std::istreambuf_iterator<char>(plain), {});
     std::string const name = path + ".profiled";
-    Moka::Testing::FileBytes const file =
-        Moka::Testing::EmbedProfile(bytes, Moka::Testing::ReadProfile(profile));
     std::ofstream(name, std::ios::binary)
-        .write(reinterpret_cast<char const*>(file.data()), static_cast<std::streamsize>(file.size()));
+        << Moka::Testing::EmbedProfile(bytes, Moka::Testing::ReadProfile(profile));
     String const profiled(name);
     for (auto _ : state) {
         std::unique_ptr<Bitmap> const bitmap(BitmapFactory::CreateBitmapForGraphics(&profiled));

@@ -1,8 +1,5 @@
 #include "tests/support/ColorProfiles.h"
 
-#include <algorithm>
-#include <cstdint>
-#include <cstring>
 #include <fstream>
 #include <iterator>
 #include <stdexcept>
@@ -11,113 +8,91 @@
 namespace Moka::Testing {
 namespace {
 
+using namespace std::string_literals;
+
 constexpr std::size_t kPngHeader = 33; // signature and IHDR; our encoder's sRGB chunk follows
 constexpr std::size_t kSrgbChunk = 13;
 constexpr unsigned kWebpProfileFlag = 0x20;
 constexpr unsigned kWebpAlphaFlag = 0x10;
 
-void Append(FileBytes& bytes, FileBytes const& more) { bytes.insert(bytes.end(), more.begin(), more.end()); }
-void Append(FileBytes& bytes, std::string const& text) {
-    bytes.insert(bytes.end(), text.begin(), text.end());
-}
-void AppendBig(FileBytes& bytes, std::size_t value, int count) {
-    while (count-- > 0) bytes.push_back(static_cast<unsigned char>(value >> (8 * count)));
-}
-void AppendLittle(FileBytes& bytes, std::size_t value, int count) {
-    for (int i = 0; i < count; ++i) bytes.push_back(static_cast<unsigned char>(value >> (8 * i)));
+Bytef const* DataOf(Bytes const& bytes) { return reinterpret_cast<Bytef const*>(bytes.data()); }
+
+Bytes EmbedInPng(Bytes const& file, Bytes const& profile) {
+    return PutBeforePixels(file, MakePngChunk("iCCP", "test\0\0"s + Deflate(profile)));
 }
 
-FileBytes EmbedInPng(FileBytes const& file, FileBytes const& profile) {
-    uLongf size = compressBound(static_cast<uLong>(profile.size()));
-    FileBytes packed(size);
-    compress(packed.data(), &size, profile.data(), static_cast<uLong>(profile.size()));
-    packed.resize(size);
-    FileBytes content;
-    Append(content, std::string("test\0\0", 6));
-    Append(content, packed);
-    return PutBeforePixels(file, MakePngChunk("iCCP", content));
-}
-
-FileBytes EmbedInJpeg(FileBytes const& file, FileBytes const& profile, std::size_t partBytes) {
+Bytes EmbedInJpeg(Bytes const& file, Bytes const& profile, std::size_t partBytes) {
     std::size_t const count = (profile.size() + partBytes - 1) / partBytes;
-    FileBytes result(file.begin(), file.begin() + 2);
+    Bytes parts;
     for (std::size_t i = count; i-- > 0;) {
-        std::size_t const begin = i * partBytes;
-        std::size_t const end = std::min(profile.size(), begin + partBytes);
-        Append(result, std::string("\xFF\xE2", 2));
-        AppendBig(result, 2 + 14 + end - begin, 2);
-        Append(result, std::string("ICC_PROFILE\0", 12));
-        AppendBig(result, i + 1, 1);
-        AppendBig(result, count, 1);
-        Append(result, FileBytes(profile.begin() + static_cast<std::ptrdiff_t>(begin),
-                                 profile.begin() + static_cast<std::ptrdiff_t>(end)));
+        Bytes const part = profile.substr(i * partBytes, partBytes);
+        parts += "\xFF\xE2" + ToBigEndian(2 + 14 + part.size(), 2) + "ICC_PROFILE\0"s +
+                 ToBigEndian(i + 1, 1) + ToBigEndian(count, 1) + part;
     }
-    Append(result, FileBytes(file.begin() + 2, file.end()));
-    return result;
+    return Bytes(file).insert(2, parts);
 }
 
 // The sides of a simple file stand in its one chunk, lossless.
-FileBytes EmbedInWebp(FileBytes const& file, FileBytes const& profile) {
-    auto const byte = [&file](std::size_t at) { return static_cast<unsigned>(file[at]); };
-    unsigned const bits = byte(21) | byte(22) << 8 | byte(23) << 16 | byte(24) << 24;
-    FileBytes chunks = MakeWebpChunk("ICCP", profile);
-    Append(chunks, FileBytes(file.begin() + 12, file.end()));
-    return MakeWebpFile(kWebpProfileFlag | kWebpAlphaFlag, static_cast<int>(bits & 0x3FFF) + 1,
-                        static_cast<int>(bits >> 14 & 0x3FFF) + 1, chunks);
+Bytes EmbedInWebp(Bytes const& file, Bytes const& profile) {
+    auto const byte = [&file](std::size_t at) { return static_cast<unsigned char>(file[at]); };
+    int const bits = byte(21) | byte(22) << 8 | byte(23) << 16 | (byte(24) & 0xF) << 24;
+    return MakeWebpFile(kWebpProfileFlag | kWebpAlphaFlag, (bits & 0x3FFF) + 1, (bits >> 14) + 1,
+                        MakeWebpChunk("ICCP", profile) + file.substr(12));
 }
 
 } // namespace
 
-FileBytes ReadProfile(std::string const& name) {
-    std::ifstream file(MOKA_PROFILE_FOLDER "/" + name, std::ios::binary);
-    FileBytes bytes(std::istreambuf_iterator<char>(file), {});
-    if (bytes.empty()) throw std::runtime_error("no profile " + name);
-    bytes.erase(bytes.begin()); // for the fuzzer: the kind of pixels
+Bytes ToLittleEndian(std::uint64_t value, int count) {
+    Bytes bytes;
+    for (int i = 0; i < count; ++i) bytes += static_cast<char>(value >> (8 * i));
     return bytes;
 }
 
-FileBytes EmbedProfile(FileBytes const& file, FileBytes const& profile, std::size_t partBytes) {
-    if (file[0] == 0xFF) return EmbedInJpeg(file, profile, partBytes);
+Bytes ToBigEndian(std::uint64_t value, int count) {
+    Bytes const bytes = ToLittleEndian(value, count);
+    return {bytes.rbegin(), bytes.rend()};
+}
+
+Bytes Deflate(Bytes const& content) {
+    uLongf size = compressBound(content.size());
+    Bytes packed(size, '\0');
+    compress(reinterpret_cast<Bytef*>(packed.data()), &size, DataOf(content), content.size());
+    return packed.substr(0, size);
+}
+
+Bytes ReadProfile(std::string const& name) {
+    std::ifstream file(MOKA_PROFILE_FOLDER "/" + name, std::ios::binary);
+    file.ignore(); // for the fuzzer: the kind of pixels
+    Bytes bytes(std::istreambuf_iterator<char>(file), {});
+    if (bytes.empty()) throw std::runtime_error("no profile " + name);
+    return bytes;
+}
+
+Bytes EmbedProfile(Bytes const& file, Bytes const& profile, std::size_t partBytes) {
+    if (file[0] == '\xFF') return EmbedInJpeg(file, profile, partBytes);
     return file[0] == 'R' ? EmbedInWebp(file, profile) : EmbedInPng(file, profile);
 }
 
-FileBytes MakePngChunk(std::string const& type, FileBytes const& content) {
-    FileBytes chunk;
-    AppendBig(chunk, content.size(), 4);
-    Append(chunk, type);
-    Append(chunk, content);
-    AppendBig(chunk, crc32(0, chunk.data() + 4, static_cast<uInt>(chunk.size() - 4)), 4);
-    return chunk;
+Bytes MakePngChunk(std::string const& type, Bytes const& content) {
+    Bytes const checked = type + content;
+    return ToBigEndian(content.size(), 4) + checked +
+           ToBigEndian(crc32(0, DataOf(checked), static_cast<uInt>(checked.size())), 4);
 }
 
-FileBytes PutBeforePixels(FileBytes const& png, FileBytes const& chunks) {
-    FileBytes result(png.begin(), png.begin() + kPngHeader);
-    Append(result, chunks);
-    bool const hasMark = std::memcmp(png.data() + kPngHeader + 4, "sRGB", 4) == 0;
-    auto const rest = static_cast<std::ptrdiff_t>(kPngHeader + (hasMark ? kSrgbChunk : 0));
-    Append(result, FileBytes(png.begin() + rest, png.end()));
-    return result;
+Bytes PutBeforePixels(Bytes png, Bytes const& chunks) {
+    bool const hasMark = png.compare(kPngHeader + 4, 4, "sRGB") == 0;
+    return png.replace(kPngHeader, hasMark ? kSrgbChunk : 0, chunks);
 }
 
-FileBytes MakeWebpChunk(std::string const& type, FileBytes const& content) {
-    FileBytes chunk;
-    Append(chunk, type);
-    AppendLittle(chunk, content.size(), 4);
-    Append(chunk, content);
-    if (content.size() % 2 != 0) chunk.push_back(0);
-    return chunk;
+Bytes MakeWebpChunk(std::string const& type, Bytes const& content) {
+    return type + ToLittleEndian(content.size(), 4) + content + Bytes(content.size() % 2, '\0');
 }
 
-FileBytes MakeWebpFile(unsigned flags, int width, int height, FileBytes const& chunks) {
-    FileBytes header;
-    AppendLittle(header, flags, 4);
-    AppendLittle(header, static_cast<std::size_t>(width - 1), 3);
-    AppendLittle(header, static_cast<std::size_t>(height - 1), 3);
-    FileBytes content;
-    Append(content, "WEBP");
-    Append(content, MakeWebpChunk("VP8X", header));
-    Append(content, chunks);
-    return MakeWebpChunk("RIFF", content);
+Bytes MakeWebpFile(unsigned flags, int width, int height, Bytes const& chunks) {
+    auto const side = [](int length) { return ToLittleEndian(static_cast<unsigned>(length - 1), 3); };
+    return MakeWebpChunk(
+        "RIFF",
+        "WEBP" + MakeWebpChunk("VP8X", ToLittleEndian(flags, 4) + side(width) + side(height)) + chunks);
 }
 
 } // namespace Moka::Testing

@@ -7,6 +7,7 @@
 #include <cerrno>
 #include <cstdarg>
 #include <cstddef>
+#include <cstring>
 #include <fcntl.h>
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
@@ -59,12 +60,6 @@ std::size_t Cut(std::size_t count) { return Is(Mode::Short) ? std::min(count, kM
 bool IsAtEnd() { return Is(Mode::Truncate) && sweep.count >= sweep.first; }
 
 } // namespace
-} // namespace Moka::Testing
-
-using Moka::Testing::Cut;
-using Moka::Testing::Fails;
-using Moka::Testing::IsAtEnd;
-using Moka::Testing::IsInterrupted;
 
 // The C library's, for the whole process: its own names, seen by every library.
 #define MOKA_INTERPOSED extern "C" __attribute__((visibility("default")))
@@ -114,10 +109,8 @@ MOKA_INTERPOSED off_t lseek(int file, off_t offset, int whence) noexcept {
     return Fails("lseek") ? -1 : syscall(SYS_lseek, file, offset, whence);
 }
 
-namespace Moka::Testing {
 namespace {
 
-constexpr Mode kFailing[] = {Mode::Fail, Mode::FailAll};
 constexpr int kErrors[] = {ENOSPC, EACCES, EIO};
 
 class FileFault : public ::testing::TestWithParam<char const*> {
@@ -155,7 +148,7 @@ TEST_P(FileFault, ASaveShowsTheOldFileOrTheWholeNewOne) {
     // The file is on the disk before it takes the name, and the folder after.
     EXPECT_THAT(sweep.calls, ::testing::EndsWith(" fsync close rename open fsync close "));
     int failures = 0;
-    for (Mode const mode : kFailing)
+    for (Mode const mode : {Mode::Fail, Mode::FailAll})
         for (int const error : kErrors)
             for (int k = 1; k <= count; ++k) {
                 SCOPED_TRACE(std::to_string(k) + " of " + std::to_string(count) + " error " +
@@ -167,6 +160,7 @@ TEST_P(FileFault, ASaveShowsTheOldFileOrTheWholeNewOne) {
                 EXPECT_EQ(ReadFile() == newBytes, isSaved);
                 EXPECT_EQ(ReadFile() == oldBytes, !isSaved);
                 EXPECT_EQ(mLog.Count(ANDROID_LOG_ERROR), isSaved ? 0 : 1);
+                EXPECT_EQ(mLog.Count(ANDROID_LOG_ERROR, std::strerror(error)), isSaved ? 0 : 1);
                 EXPECT_TRUE(IsAlone());
                 if (!isSaved) ++failures;
             }

@@ -5,7 +5,6 @@
 
 #include <cmath>
 #include <memory>
-#include <random>
 #include <turbojpeg.h>
 
 namespace Moka::Testing {
@@ -24,25 +23,7 @@ Picture FromBitmap(Bitmap* bitmap) {
 } // namespace
 
 Picture Fill(int width, int height, Color const& color) {
-    Picture image(width, height);
-    for (std::size_t i = 0; i < image.pixels.size(); ++i) image.pixels[i] = color[i % 4];
-    return image;
-}
-
-Picture MakeTranslucentNoise(int width, int height, unsigned seed) {
-    std::mt19937 random(seed);
-    Picture image(width, height);
-    for (std::size_t i = 0; i < image.pixels.size(); i += 4) {
-        unsigned const alpha = random() % 256;
-        for (std::size_t c = 0; c < 3; ++c)
-            image.pixels[i + c] = static_cast<unsigned char>(random() % (alpha + 1));
-        image.pixels[i + 3] = static_cast<unsigned char>(alpha);
-    }
-    return image;
-}
-
-Picture MakeOpaqueNoise(int width, int height) {
-    return FlattenOnWhite(MakeTranslucentNoise(width, height, 1));
+    return MakeChecker(width, height, 1, color, color);
 }
 
 Picture MakeGradient(int width, int height, bool isOpaque) {
@@ -78,18 +59,7 @@ Picture Scale(Picture const& source, int width, int height) {
     return result;
 }
 
-int LargestDifference(Picture const& a, Picture const& b) {
-    return a.pixels.empty() ? 256 : CompareImages(a, b).largest;
-}
-
-void WriteBytes(std::string const& path, Bytes const& bytes) {
-    WriteFile(path, std::string(bytes.begin(), bytes.end()));
-}
-
-Bytes ReadBytes(std::string const& path) {
-    std::string const content = ReadFile(path);
-    return Bytes(content.begin(), content.end());
-}
+int LargestDifference(Picture const& a, Picture const& b) { return CompareImages(a, b).largest; }
 
 ErrorLines::~ErrorLines() { EXPECT_THAT(Take(), ::testing::IsEmpty()); }
 
@@ -108,11 +78,6 @@ Picture Decode(Bytes const& file, char const* name) {
     return FromBitmap(BitmapFactory::CreateBitmapFromMemory(file.data(), file.size(), name));
 }
 
-Picture DecodeFile(std::string const& path) {
-    String const text(path);
-    return FromBitmap(BitmapFactory::CreateBitmapForGraphics(&text));
-}
-
 Picture DecodeScaled(std::string const& path, int width, int height) {
     String const text(path);
     return FromBitmap(BitmapFactory::CreateBitmap(&text, width, height));
@@ -125,12 +90,12 @@ ImageInfo GetInfo(std::string const& path) {
     return info;
 }
 
-Bytes MakeJpeg(Bytes const& pixels, int width, int height, int format, int subsampling, int flags) {
+Bytes MakeJpeg(Picture const& image, int format, int subsampling, int flags) {
     tjhandle const handle = tjInitCompress();
     unsigned char* encoded = nullptr;
     unsigned long size = 0;
-    EXPECT_EQ(tjCompress2(handle, pixels.data(), width, 0, height, format, &encoded, &size, subsampling, 100,
-                          flags),
+    EXPECT_EQ(tjCompress2(handle, image.pixels.data(), image.width, 0, image.height, format, &encoded, &size,
+                          subsampling, 100, flags),
               0);
     Bytes bytes(encoded, encoded + size);
     tjFree(encoded);
@@ -142,45 +107,7 @@ Bytes Encode(Picture const& image, std::string const& extension, int quality) {
     TempFolder const folder;
     std::string const path = folder.Path("image." + extension);
     EXPECT_TRUE(SaveImage(image, path, quality));
-    return ReadBytes(path);
-}
-
-Bytes MakePlainJpeg(Bytes const& pixel, int format, int subsampling) {
-    Bytes pixels;
-    for (int i = 0; i < 256; ++i) pixels = std::move(pixels) + pixel;
-    return MakeJpeg(pixels, 16, 16, format, subsampling);
-}
-
-Bytes ToLittleEndian(std::uint64_t value, int count) {
-    Bytes bytes;
-    for (int i = 0; i < count; ++i) bytes.push_back(static_cast<unsigned char>(value >> (8 * i)));
-    return bytes;
-}
-
-Bytes ToBigEndian(std::uint64_t value, int count) {
-    Bytes const bytes = ToLittleEndian(value, count);
-    return Bytes(bytes.rbegin(), bytes.rend());
-}
-
-Bytes operator+(Bytes bytes, Bytes const& more) {
-    bytes.insert(bytes.end(), more.begin(), more.end());
-    return bytes;
-}
-
-Bytes Replace(Bytes bytes, std::size_t at, Bytes const& with) {
-    std::copy(with.begin(), with.end(), bytes.begin() + static_cast<std::ptrdiff_t>(at));
-    return bytes;
-}
-
-Bytes Insert(Bytes bytes, std::size_t at, Bytes const& what) {
-    bytes.insert(bytes.begin() + static_cast<std::ptrdiff_t>(at), what.begin(), what.end());
-    return bytes;
-}
-
-std::size_t Find(Bytes const& bytes, Bytes const& what) {
-    auto const found = std::search(bytes.begin(), bytes.end(), what.begin(), what.end());
-    EXPECT_NE(found, bytes.end());
-    return static_cast<std::size_t>(found - bytes.begin());
+    return ReadFile(path);
 }
 
 } // namespace Moka::Testing

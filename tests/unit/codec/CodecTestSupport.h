@@ -4,11 +4,11 @@
 #include "moka/base/Bitmap.h"
 #include "moka/base/BitmapFactory.h"
 #include "moka/base/String.h"
+#include "tests/support/ColorProfiles.h"
 #include "tests/support/ImageCompare.h"
 #include "tests/support/LogCapture.h"
 #include "tests/support/TestFiles.h"
 
-#include <cstdint>
 #include <gmock/gmock.h>
 
 namespace Moka::Testing {
@@ -17,13 +17,8 @@ using ::testing::AllOf;
 using ::testing::ElementsAre;
 using ::testing::HasSubstr;
 
-using Bytes = std::vector<unsigned char>;
-
 // Every pixel the same.
 Picture Fill(int width, int height, Color const& color);
-// Every alpha occurs, and colours from 0 up to it.
-Picture MakeTranslucentNoise(int width, int height, unsigned seed = 1);
-Picture MakeOpaqueNoise(int width, int height);
 // Smooth, so that lossy codecs come close.
 Picture MakeGradient(int width, int height, bool isOpaque);
 Picture FlattenOnWhite(Picture image);
@@ -31,11 +26,8 @@ Picture FlattenOnWhite(Picture image);
 // As the codecs' own scaler does it.
 Picture Scale(Picture const& source, int width, int height);
 
-// The greatest difference of any byte; 256 when the sizes differ.
+// The greatest difference of any byte; 255 when the sizes differ.
 int LargestDifference(Picture const& a, Picture const& b);
-
-void WriteBytes(std::string const& path, Bytes const& bytes);
-Bytes ReadBytes(std::string const& path);
 
 // Error lines while it lives. Everything else fails the test: codecs have nothing else to say.
 class ErrorLines : public LogCapture {
@@ -46,23 +38,12 @@ public:
 
 // Empty images when the factory returns null.
 Picture Decode(Bytes const& file, char const* name = "test");
-Picture DecodeFile(std::string const& path);
 Picture DecodeScaled(std::string const& path, int width, int height);
 // Fails the test when the factory finds none.
 ImageInfo GetInfo(std::string const& path);
-// By libjpeg-turbo, of pixels in one of its formats. The second has one colour.
-Bytes MakeJpeg(Bytes const& pixels, int width, int height, int format, int subsampling, int flags = 0);
-Bytes MakePlainJpeg(Bytes const& pixel, int format, int subsampling);
+// By libjpeg-turbo; the format says what the pixels' bytes mean.
+Bytes MakeJpeg(Picture const& image, int format, int subsampling, int flags = 0);
 // The file's bytes.
 Bytes Encode(Picture const& image, std::string const& extension, int quality = 100);
-
-Bytes ToLittleEndian(std::uint64_t value, int count);
-Bytes ToBigEndian(std::uint64_t value, int count);
-
-// Edits in a copy.
-Bytes operator+(Bytes bytes, Bytes const& more);
-Bytes Replace(Bytes bytes, std::size_t at, Bytes const& with);
-Bytes Insert(Bytes bytes, std::size_t at, Bytes const& what);
-std::size_t Find(Bytes const& bytes, Bytes const& what); // fails the test when it is not there
 
 } // namespace Moka::Testing

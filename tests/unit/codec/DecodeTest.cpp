@@ -10,68 +10,44 @@ namespace Moka::Testing {
 namespace {
 
 struct PngKind {
-    int colourType;
+    int type;
     int depth;
-    bool hasTransparency = false; // a tRNS chunk
-    bool isInterlaced = false;
+    bool hasTransparency; // a tRNS chunk
+    bool isInterlaced;
 };
 
-std::vector<PngKind> AllKinds() {
-    std::vector<PngKind> kinds;
-    for (int const type : {PNG_COLOR_TYPE_GRAY, PNG_COLOR_TYPE_PALETTE, PNG_COLOR_TYPE_RGB,
-                           PNG_COLOR_TYPE_GRAY_ALPHA, PNG_COLOR_TYPE_RGBA}) {
-        for (int const depth : {1, 2, 4, 8, 16}) {
-            bool const isSmall = depth < 8;
-            if (type != PNG_COLOR_TYPE_GRAY && depth != 8 && isSmall != (type == PNG_COLOR_TYPE_PALETTE))
-                continue;
-            kinds.push_back({type, depth, false});
-            if (!(type & PNG_COLOR_MASK_ALPHA)) kinds.push_back({type, depth, true});
-        }
-    }
-    return kinds;
-}
-
-void Append(png_structp png, png_bytep data, std::size_t count) {
-    auto* const bytes = static_cast<Bytes*>(png_get_io_ptr(png));
-    bytes->insert(bytes->end(), data, data + count);
-}
-
-void WritePalette(png_structp png, png_infop info, PngKind const& kind, std::mt19937& random) {
-    png_color palette[256];
-    png_byte alphas[256];
-    auto const next = [&random] { return static_cast<png_byte>(random()); };
-    for (png_color& colour : palette) colour = {next(), next(), next()};
-    for (png_byte& alpha : alphas) alpha = next();
-    png_set_PLTE(png, info, palette, 1 << kind.depth);
-    if (kind.hasTransparency) png_set_tRNS(png, info, alphas, 1 << kind.depth, nullptr);
-}
+struct Pass {
+    int x, y, stepX, stepY;
+};
+std::vector<Pass> const kWhole{{0, 0, 1, 1}};
+std::vector<Pass> const kAdam7{{0, 0, 8, 8}, {4, 0, 8, 8}, {0, 4, 4, 8}, {2, 0, 4, 4},
+                               {0, 2, 2, 4}, {1, 0, 2, 2}, {0, 1, 1, 2}};
 
 // Of random samples, whatever they mean, many of them zero; the transparent colour, if any, is zero.
 Bytes MakePng(PngKind const& kind, int width, int height) {
-    std::mt19937 random(static_cast<unsigned>(kind.colourType * 100 + kind.depth));
-    Bytes bytes;
-    png_structp png = png_create_write_struct(PNG_LIBPNG_VER_STRING, nullptr, nullptr, nullptr);
-    png_infop info = png_create_info_struct(png);
-    png_set_write_fn(png, &bytes, Append, nullptr);
-    png_set_IHDR(png, info, static_cast<png_uint_32>(width), static_cast<png_uint_32>(height), kind.depth,
-                 kind.colourType, kind.isInterlaced ? PNG_INTERLACE_ADAM7 : PNG_INTERLACE_NONE,
-                 PNG_COMPRESSION_TYPE_DEFAULT, PNG_FILTER_TYPE_DEFAULT);
-    png_color_16 const zero = {};
-    if (kind.colourType == PNG_COLOR_TYPE_PALETTE)
-        WritePalette(png, info, kind, random);
-    else if (kind.hasTransparency)
-        png_set_tRNS(png, info, nullptr, 0, &zero);
-    std::vector<Bytes> rows(static_cast<std::size_t>(height), Bytes(png_get_rowbytes(png, info)));
-    std::vector<png_bytep> pointers;
-    for (Bytes& row : rows) {
-        for (unsigned char& byte : row) byte = static_cast<unsigned char>(random() % 2 ? random() : 0);
-        pointers.push_back(row.data());
+    std::mt19937 random(static_cast<unsigned>(kind.type * 100 + kind.depth));
+    auto const noise = [&random](int count) {
+        Bytes bytes;
+        for (int i = 0; i < count; ++i) bytes += static_cast<char>(random() % 2 ? random() : 0);
+        return bytes;
+    };
+    constexpr int kChannels[] = {1, 0, 3, 1, 2, 0, 4}; // of each type
+    Bytes rows;
+    for (Pass const& pass : kind.isInterlaced ? kAdam7 : kWhole) {
+        int const columns = (width - pass.x + pass.stepX - 1) / pass.stepX;
+        for (int y = pass.y; y < height && columns > 0; y += pass.stepY)
+            rows += '\0' + noise((columns * kChannels[kind.type] * kind.depth + 7) / 8);
     }
-    png_write_info(png, info);
-    png_write_image(png, pointers.data());
-    png_write_end(png, info);
-    png_destroy_write_struct(&png, &info);
-    return bytes;
+    Bytes const header = ToBigEndian(static_cast<unsigned>(width), 4) +
+                         ToBigEndian(static_cast<unsigned>(height), 4) + static_cast<char>(kind.depth) +
+                         static_cast<char>(kind.type) + '\0' + '\0' + static_cast<char>(kind.isInterlaced);
+    Bytes file = "\x89PNG\r\n\x1A\n" + MakePngChunk("IHDR", header);
+    bool const hasPalette = kind.type == PNG_COLOR_TYPE_PALETTE;
+    if (hasPalette) file += MakePngChunk("PLTE", noise(3 << kind.depth));
+    if (kind.hasTransparency)
+        file += MakePngChunk("tRNS",
+                             hasPalette ? noise(1 << kind.depth) : Bytes(kChannels[kind.type] * 2U, '\0'));
+    return file + MakePngChunk("IDAT", Deflate(rows)) + MakePngChunk("IEND", "");
 }
 
 // As libpng's simple interface reads it, which takes none of the decoder's decisions, premultiplied here.
@@ -90,33 +66,43 @@ Picture ReadSimply(Bytes const& file) {
     return image;
 }
 
-TEST(PngDecode, EveryColourTypeDepthAndInterlacingBecomesItsExactPixels) {
-    ErrorLines const errors;
+void ExpectExactPixels(PngKind const& kind) {
     TempFolder const folder;
     std::string const path = folder.Path("a.png");
-    for (PngKind kind : AllKinds()) {
-        for (int const side : {2, 3, 19}) {
-            SCOPED_TRACE(::testing::Message() << "type " << kind.colourType << " depth " << kind.depth
-                                              << " tRNS " << kind.hasTransparency << " side " << side);
-            kind.isInterlaced = false;
-            Picture const expected = ReadSimply(MakePng(kind, side, 21 - side));
-            WriteBytes(path, MakePng(kind, side, 21 - side));
-            EXPECT_EQ(GetInfo(path).hasAlpha,
-                      kind.hasTransparency || (kind.colourType & PNG_COLOR_MASK_ALPHA) != 0);
-            EXPECT_TRUE(DecodeFile(path) == expected);
-            Picture const scaled = DecodeScaled(path, 13, 5);
-            kind.isInterlaced = true;
-            WriteBytes(path, MakePng(kind, side, 21 - side));
-            EXPECT_TRUE(DecodeFile(path) == expected);
-            EXPECT_TRUE(DecodeScaled(path, 13, 5) == scaled);
-        }
+    // Of interlaced images of 16 bits that lack a pass, the simple interface returns some pixels twice.
+    bool const isSimple = kind.depth < 16 || !kind.isInterlaced;
+    for (int const side : isSimple ? std::vector<int>{2, 3, 19} : std::vector<int>{19}) {
+        SCOPED_TRACE(::testing::Message()
+                     << "type " << kind.type << " depth " << kind.depth << " tRNS " << kind.hasTransparency
+                     << " interlaced " << kind.isInterlaced << " side " << side);
+        Bytes const file = MakePng(kind, side, 21 - side);
+        WriteFile(path, file);
+        Picture const expected = ReadSimply(file);
+        EXPECT_EQ(GetInfo(path).hasAlpha, kind.hasTransparency || (kind.type & PNG_COLOR_MASK_ALPHA) != 0);
+        EXPECT_TRUE(LoadImage(path) == expected);
+        EXPECT_TRUE(DecodeScaled(path, 13, 5) == Scale(expected, 13, 5));
     }
+}
+
+TEST(PngDecode, EveryColourTypeDepthAndInterlacingBecomesItsExactPixels) {
+    ErrorLines const errors;
+    std::pair<int, std::vector<int>> const depths[] = {{PNG_COLOR_TYPE_GRAY, {1, 2, 4, 8, 16}},
+                                                       {PNG_COLOR_TYPE_PALETTE, {1, 2, 4, 8}},
+                                                       {PNG_COLOR_TYPE_RGB, {8, 16}},
+                                                       {PNG_COLOR_TYPE_GRAY_ALPHA, {8, 16}},
+                                                       {PNG_COLOR_TYPE_RGBA, {8, 16}}};
+    for (auto const& [type, ofType] : depths)
+        for (int const depth : ofType)
+            for (bool const hasTransparency : {false, true})
+                for (bool const isInterlaced : {false, true})
+                    if (!hasTransparency || !(type & PNG_COLOR_MASK_ALPHA))
+                        ExpectExactPixels({type, depth, hasTransparency, isInterlaced});
 }
 
 // An application segment full of what looks like the end of an image.
 Bytes MakePreviewSegment() {
-    Bytes segment = {0xFF, 0xE1, 0xFF, 0xFD};
-    while (segment.size() < 2 + 0xFFFD) segment.push_back(segment.size() % 2 == 0 ? 0xFF : 0xD9);
+    Bytes segment = "\xFF\xE1\xFF\xFC";
+    while (segment.size() < 2 + 0xFFFC) segment += "\xFF\xD9";
     return segment;
 }
 
@@ -125,11 +111,12 @@ TEST(JpegDecode, EveryColourSpaceAndCodingBecomesOpaqueRgb) {
     Picture const image = MakeGradient(83, 61, true);
     for (int subsampling : {TJSAMP_444, TJSAMP_422, TJSAMP_420, TJSAMP_440, TJSAMP_411}) {
         for (int flags : {0, TJFLAG_PROGRESSIVE}) {
-            Bytes const file = MakeJpeg(image.pixels, 83, 61, TJPF_RGBA, subsampling, flags);
+            Bytes const file = MakeJpeg(image, TJPF_RGBA, subsampling, flags);
             EXPECT_LE(LargestDifference(Decode(file), image), 12) << subsampling << ' ' << flags;
         }
     }
-    EXPECT_EQ(Decode(MakePlainJpeg({77}, TJPF_GRAY, TJSAMP_GRAY)), Fill(16, 16, {77, 77, 77, 255}));
+    EXPECT_EQ(Decode(MakeJpeg(Fill(16, 16, {77, 77, 77, 77}), TJPF_GRAY, TJSAMP_GRAY)),
+              Fill(16, 16, {77, 77, 77, 255}));
 }
 
 TEST(JpegDecode, FourInksMixToRgbByEitherConvention) {
@@ -138,13 +125,12 @@ TEST(JpegDecode, FourInksMixToRgbByEitherConvention) {
         return LargestDifference(Decode(file), Fill(16, 16, color)) <= 4;
     };
     // With Adobe's marker the numbers are light: 255 is no ink. The library codes them as YCCK.
-    Bytes const light = MakePlainJpeg({200, 100, 50, 255}, TJPF_CMYK, TJSAMP_444);
+    Bytes const light = MakeJpeg(Fill(16, 16, {200, 100, 50, 255}), TJPF_CMYK, TJSAMP_444);
     EXPECT_TRUE(isNear(light, {200, 100, 50, 255}));
-    Bytes dark = MakePlainJpeg({240, 240, 240, 128}, TJPF_CMYK, TJSAMP_420);
+    Bytes dark = MakeJpeg(Fill(16, 16, {240, 240, 240, 128}), TJPF_CMYK, TJSAMP_420);
     EXPECT_TRUE(isNear(dark, {120, 120, 120, 255}));
     // Without it the same components (15, 128, 128, 128 in the file) are ink.
-    auto const marker = dark.begin() + static_cast<std::ptrdiff_t>(Find(dark, {0xFF, 0xEE}));
-    dark.erase(marker, marker + 16);
+    dark.erase(dark.find("\xFF\xEE"), 16);
     EXPECT_TRUE(isNear(dark, {120, 63, 63, 255}));
 }
 
@@ -152,11 +138,11 @@ TEST(JpegDecode, LongHeadersAreReadToTheirEndAndPreviewsDoNotCountAsIt) {
     ErrorLines errors;
     TempFolder const folder;
     Picture const image = MakeGradient(40, 30, true);
-    Bytes file = MakeJpeg(image.pixels, 40, 30, TJPF_RGBA, TJSAMP_444);
-    for (int i = 0; i < 12; ++i) file = Insert(file, 2, MakePreviewSegment());
-    WriteBytes(folder.Path("photo.jpg"), file);
+    Bytes file = MakeJpeg(image, TJPF_RGBA, TJSAMP_444);
+    for (int i = 0; i < 12; ++i) file.insert(2, MakePreviewSegment());
+    WriteFile(folder.Path("photo.jpg"), file);
     EXPECT_EQ(GetInfo(folder.Path("photo.jpg")).width, 40);
-    EXPECT_LE(LargestDifference(DecodeFile(folder.Path("photo.jpg")), image), 4);
+    EXPECT_LE(LargestDifference(LoadImage(folder.Path("photo.jpg")), image), 4);
     file.resize(file.size() - 2);
     EXPECT_TRUE(Decode(file).pixels.empty());
     EXPECT_THAT(errors.Take(), ElementsAre(HasSubstr("truncated")));

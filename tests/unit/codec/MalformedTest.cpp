@@ -44,17 +44,16 @@ protected:
 
 // With checksums wrong pixels are never shown, and no header is believed that is not the one written.
 TEST_F(Malformed, EveryCutIsRefusedAndEveryChangedByteToo) {
-    Picture const image = MakeTranslucentNoise(7, 5);
+    Picture const image = MakeAlphaPattern(7, 5);
     for (Kind const& kind : kKinds) {
         Bytes const file = Encode(image, kind.extension, kind.quality);
         for (std::size_t i = 0; i < file.size(); ++i) {
-            ASSERT_TRUE(Refuses(Bytes(file.begin(), file.begin() + static_cast<std::ptrdiff_t>(i))))
-                << kind.extension << " cut to " << i;
+            ASSERT_TRUE(Refuses(file.substr(0, i))) << kind.extension << " cut to " << i;
             bool const isHeader = i < kind.checkedHeader;
             for (unsigned flip = 1; flip < 256; flip += isHeader ? 1 : 127) {
                 SCOPED_TRACE(testing::Message() << kind.extension << " byte " << i << " xor " << flip);
                 Bytes changed = file;
-                changed[i] = static_cast<unsigned char>(changed[i] ^ flip);
+                changed[i] = static_cast<char>(changed[i] ^ static_cast<char>(flip));
                 bool const isRefused = Refuses(changed);
                 ASSERT_TRUE(isRefused || !isHeader);
                 if (kind.checkedHeader > 0 && !isRefused) {
@@ -66,19 +65,17 @@ TEST_F(Malformed, EveryCutIsRefusedAndEveryChangedByteToo) {
 }
 
 Bytes MakePngHeader(std::uint32_t width, std::uint32_t height) {
-    Bytes file = Encode(MakeOpaqueNoise(4, 4), "png");
-    file = Replace(file, 16, ToBigEndian(width, 4) + ToBigEndian(height, 4));
-    return Replace(file, 29, ToBigEndian(crc32(0, &file[12], 17), 4));
-}
-
-// An extended header, whose flags and two sides, less one, follow.
-Bytes MakeWebpHeader(Bytes const& rest) {
-    return Bytes{'R', 'I', 'F', 'F', 22, 0, 0, 0, 'W', 'E', 'B', 'P', 'V', 'P', '8', 'X', 10, 0, 0, 0} + rest;
+    Bytes const file = Encode(MakeGradient(4, 4), "png");
+    Bytes const size = ToBigEndian(width, 4) + ToBigEndian(height, 4);
+    return file.substr(0, 8) + MakePngChunk("IHDR", size + file.substr(24, 5)) + file.substr(33);
 }
 
 TEST_F(Malformed, ClaimsOutsideTheLimitsAreRefusedBeforeAnythingIsAllocated) {
-    Bytes const jpeg = Encode(MakeOpaqueNoise(8, 8), "jpg", 80);
-    std::size_t const frame = Find(jpeg, {0xFF, 0xC0});
+    Bytes const jpeg = Encode(MakeGradient(8, 8), "jpg", 80);
+    auto const withSides = [&](unsigned height, unsigned width) {
+        return Bytes(jpeg).replace(jpeg.find("\xFF\xC0") + 5, 4,
+                                   ToBigEndian(height, 2) + ToBigEndian(width, 2));
+    };
     struct {
         Bytes file;
         char const* reason;
@@ -87,10 +84,10 @@ TEST_F(Malformed, ClaimsOutsideTheLimitsAreRefusedBeforeAnythingIsAllocated) {
         {MakePngHeader(0x7FFFFFFF, 0x7FFFFFFF), "above 65535"},
         {MakePngHeader(65535, 65535), "1 GiB"},
         {MakePngHeader(0xFFFFFFFF, 1), "out of range"},
-        {Replace(jpeg, frame + 5, {0xFF, 0xFF, 0xFF, 0xFF}), "65500"},
-        {Replace(jpeg, frame + 5, {0xFF, 0x00, 0xFF, 0x00}), "1 GiB"},
-        {Replace(jpeg, frame + 5, {0, 0, 0, 8}), "'****'"},
-        {MakeWebpHeader({0, 0, 0, 0, 255, 255, 255, 0, 0, 0}), "above 65535"},
+        {withSides(0xFFFF, 0xFFFF), "65500"},
+        {withSides(0xFF00, 0xFF00), "1 GiB"},
+        {withSides(0, 8), "'****'"},
+        {MakeWebpFile(0, 1 << 24, 1, ""), "above 65535"},
     };
     for (auto const& one : cases) {
         ArrayMemory::ResetPeak();
@@ -101,15 +98,15 @@ TEST_F(Malformed, ClaimsOutsideTheLimitsAreRefusedBeforeAnythingIsAllocated) {
     }
     // Within the limits, but there is nothing behind it.
     EXPECT_TRUE(Refuses(MakePngHeader(16384, 16384)));
-    EXPECT_TRUE(Refuses(Replace(jpeg, frame + 5, {0x20, 0x00, 0x20, 0x00})));
+    EXPECT_TRUE(Refuses(withSides(0x2000, 0x2000)));
 }
 
 TEST_F(Malformed, WhatIsNoImageFileIsRefusedByEveryReader) {
     TempFolder const folder;
-    WriteBytes(folder.Path("empty.png"), {});
-    WriteBytes(folder.Path("text.png"), {'h', 'e', 'l', 'l', 'o'});
+    WriteFile(folder.Path("empty.png"), {});
+    WriteFile(folder.Path("text.png"), "hello");
     ASSERT_EQ(mkfifo(folder.Path("pipe.png").c_str(), 0600), 0);
-    WriteBytes(folder.Path("large.png"), Encode(MakeOpaqueNoise(4, 4), "png"));
+    WriteFile(folder.Path("large.png"), Encode(MakeGradient(4, 4), "png"));
     ASSERT_EQ(truncate(folder.Path("large.png").c_str(), off_t{1} << 31), 0); // sparse
     struct {
         std::string path;
@@ -151,19 +148,21 @@ struct Fields {
 
 Bytes MakeMki(Fields const& fields, Bytes const& payload) {
     std::uint64_t const length = payload.size() + static_cast<std::uint64_t>(fields.payloadError);
-    Bytes const header = Bytes{'M', 'K', 'I', '1'} + ToLittleEndian(fields.width, 4) +
-                         ToLittleEndian(fields.height, 4) + ToLittleEndian(fields.format, 2) +
-                         ToLittleEndian(fields.compression, 2) + ToLittleEndian(length, 8);
-    return header + ToLittleEndian(crc32(0, header.data(), 24), 4) + ToLittleEndian(fields.zeros, 4) +
-           payload;
+    Bytes const header = "MKI1" + ToLittleEndian(fields.width, 4) + ToLittleEndian(fields.height, 4) +
+                         ToLittleEndian(fields.format, 2) + ToLittleEndian(fields.compression, 2) +
+                         ToLittleEndian(length, 8);
+    uLong const checksum = crc32(0, reinterpret_cast<Bytef const*>(header.data()), 24);
+    return header + ToLittleEndian(checksum, 4) + ToLittleEndian(fields.zeros, 4) + payload;
 }
+
+Bytes PixelsOf(Picture const& image) { return {image.pixels.begin(), image.pixels.end()}; }
 
 Bytes Compress(Bytes const& content, int level = 1, bool hasChecksum = true, bool hasSize = true) {
     ZSTD_CCtx* const context = ZSTD_createCCtx();
     ZSTD_CCtx_setParameter(context, ZSTD_c_compressionLevel, level);
     ZSTD_CCtx_setParameter(context, ZSTD_c_checksumFlag, hasChecksum);
     ZSTD_CCtx_setParameter(context, ZSTD_c_contentSizeFlag, hasSize);
-    Bytes frame(ZSTD_compressBound(content.size()));
+    Bytes frame(ZSTD_compressBound(content.size()), '\0');
     frame.resize(ZSTD_compress2(context, frame.data(), frame.size(), content.data(), content.size()));
     ZSTD_freeCCtx(context);
     return frame;
@@ -171,20 +170,21 @@ Bytes Compress(Bytes const& content, int level = 1, bool hasChecksum = true, boo
 
 TEST(Mki, ReadsFilesThatItDidNotWrite) {
     ErrorLines const errors;
-    Picture const image = MakeTranslucentNoise(3, 2);
-    for (int const level : {1, 19}) EXPECT_EQ(Decode(MakeMki({3, 2}, Compress(image.pixels, level))), image);
-    EXPECT_EQ(Decode(MakeMki({3, 2, 1, 0}, image.pixels)), image) << "stored";
+    Picture const image = MakeAlphaPattern(3, 2);
+    for (int const level : {1, 19})
+        EXPECT_EQ(Decode(MakeMki({3, 2}, Compress(PixelsOf(image), level))), image);
+    EXPECT_EQ(Decode(MakeMki({3, 2, 1, 0}, PixelsOf(image))), image) << "stored";
     Picture const invalid = Fill(1, 1, {9, 200, 0, 5});
-    EXPECT_EQ(Decode(MakeMki({1, 1, 1, 0}, invalid.pixels)), invalid) << "pixels are taken as they are";
+    EXPECT_EQ(Decode(MakeMki({1, 1, 1, 0}, PixelsOf(invalid))), invalid) << "pixels are taken as they are";
 }
 
 TEST(Mki, RefusesWhateverDoesNotAddUp) {
-    Bytes const pixels = MakeTranslucentNoise(3, 2).pixels;
+    Bytes const pixels = PixelsOf(MakeAlphaPattern(3, 2));
     Bytes const frame = Compress(pixels);
-    Bytes const longer(28, 1);
+    Bytes const longer(28, '\1');
     Bytes badCheck = frame;
-    badCheck.back() ^= 1;
-    Bytes const skippable = Insert(frame, 0, {0x50, 0x2A, 0x4D, 0x18, 4, 0, 0, 0, 1, 2, 3, 4});
+    ++badCheck.back();
+    Bytes const skippable = ToLittleEndian(0x184D2A50, 4) + ToLittleEndian(4, 4) + "skip" + frame;
     struct {
         Bytes file;
         char const* reason;
@@ -201,11 +201,11 @@ TEST(Mki, RefusesWhateverDoesNotAddUp) {
         {MakeMki({2, 2}, frame), "does not fit"},
         {MakeMki({3, 3}, frame), "does not fit"},
         {MakeMki({3, 2, 1, 0}, longer), "does not fit"},
-        {MakeMki({3, 2, 1, 0}, Bytes(20, 1)), "does not fit"},
+        {MakeMki({3, 2, 1, 0}, Bytes(20, '\1')), "does not fit"},
         {MakeMki({3, 2}, Compress(pixels, 1, false)), "no checksum"},
         {MakeMki({3, 2}, Compress(pixels, 1, true, false)), "does not fit"},
         {MakeMki({3, 2}, badCheck), "damaged"},
-        {MakeMki({3, 2}, Insert(frame, 0, frame)), "behind its end"},
+        {MakeMki({3, 2}, frame + frame), "behind its end"},
         {MakeMki({3, 2}, skippable), "does not fit"},
         {MakeMki({3, 2}, {}), "no Zstandard frame"},
         {MakeMki({3, 2}, longer), "no Zstandard frame"},

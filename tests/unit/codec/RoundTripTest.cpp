@@ -19,10 +19,10 @@ TEST(RoundTrip, LosslessFormatsKeepEveryPremultipliedPixel) {
         }
     }
     Picture const images[] = {valid,
-                              MakeTranslucentNoise(1, 1),
-                              MakeTranslucentNoise(1, 97),
-                              MakeTranslucentNoise(301, 1),
-                              MakeOpaqueNoise(67, 45),
+                              MakeAlphaPattern(1, 1),
+                              MakeAlphaPattern(1, 97),
+                              MakeAlphaPattern(301, 1),
+                              MakeGradient(67, 45),
                               MakeGradient(640, 480, false)};
     for (Picture const& image : images) {
         for (char const* extension : {"png", "webp", "mki"}) {
@@ -51,29 +51,29 @@ TEST(RoundTrip, LossyFormatsComeClose) {
     EXPECT_LE(LargestDifference(Decode(Encode(lines, "jpg", 90)), lines), 32);
     EXPECT_GT(LargestDifference(Decode(Encode(lines, "jpg", 89)), lines), 64);
     // Fine structure shows that quality does something, in either codec.
-    Picture const noise = MakeOpaqueNoise(64, 64);
+    Picture const fine = FlattenOnWhite(MakeAlphaPattern(64, 64));
     for (char const* extension : {"jpg", "webp"}) {
-        EXPECT_LT(Encode(noise, extension, 10).size() * 2, Encode(noise, extension, 95).size()) << extension;
-        EXPECT_EQ(Encode(noise, extension, -5), Encode(noise, extension, 0)) << extension;
-        EXPECT_EQ(Encode(noise, extension, 1000), Encode(noise, extension, 100)) << extension;
+        EXPECT_LT(Encode(fine, extension, 10).size() * 2, Encode(fine, extension, 95).size()) << extension;
+        EXPECT_EQ(Encode(fine, extension, -5), Encode(fine, extension, 0)) << extension;
+        EXPECT_EQ(Encode(fine, extension, 1000), Encode(fine, extension, 100)) << extension;
     }
 }
 
 TEST(RoundTrip, HonoursAStrideWiderThanTheRow) {
     TempFolder const folder;
-    Picture wide = MakeTranslucentNoise(42, 11);
+    Picture wide = MakeAlphaPattern(42, 11);
     Bitmap bitmap;
     ASSERT_TRUE(bitmap.Construct(wide.pixels.data(), 37, 11, 42 * 4, 1, false, false));
     for (char const* name : {"a.png", "a.webp", "a.mki"}) {
         String const path(folder.Path(name));
         ASSERT_TRUE(BitmapFactory::SaveBitmap(&bitmap, &path, 100));
-        EXPECT_EQ(DecodeFile(folder.Path(name)), wide.Crop(0, 0, 37, 11)) << name;
+        EXPECT_EQ(LoadImage(folder.Path(name)), wide.Crop(0, 0, 37, 11)) << name;
     }
 }
 
 TEST(RoundTrip, ContentDecidesWhenReadingAndTheExtensionWhenWriting) {
     TempFolder const folder;
-    Picture const image = MakeOpaqueNoise(9, 9);
+    Picture const image = MakeGradient(9, 9);
     struct {
         char const* name;
         ImageFormat format;
@@ -86,9 +86,9 @@ TEST(RoundTrip, ContentDecidesWhenReadingAndTheExtensionWhenWriting) {
         String const text(folder.Path(one.name));
         EXPECT_EQ(BitmapFactory::GetFormatByExtension(&text), one.format) << one.name;
         ASSERT_TRUE(SaveImage(image, folder.Path(one.name)));
-        WriteBytes(folder.Path("misnamed.png"), ReadBytes(folder.Path(one.name)));
+        WriteFile(folder.Path("misnamed.png"), ReadFile(folder.Path(one.name)));
         EXPECT_EQ(GetInfo(folder.Path("misnamed.png")).format, one.format) << one.name;
-        EXPECT_FALSE(DecodeFile(folder.Path("misnamed.png")).pixels.empty());
+        EXPECT_FALSE(LoadImage(folder.Path("misnamed.png")).pixels.empty());
     }
     for (char const* name : {"x.gif", "png", "x.", "x.png/y", "x.pngx", ""}) {
         String const text(name);
@@ -121,7 +121,7 @@ TEST(RowScaler, IsTheRoundedReferenceForEveryMixOfShrinkingAndGrowing) {
     std::mt19937 random(7);
     for (int round = 0; round < 300; ++round) {
         auto const side = [&random] { return 1 + static_cast<int>(random() % 24); };
-        Picture const source = MakeTranslucentNoise(side(), side(), static_cast<unsigned>(round));
+        Picture const source = MakeAlphaPattern(side(), side());
         int const width = side();
         int const height = round % 50 == 0 ? source.height : side();
         Picture const scaled = Scale(source, width, height);
@@ -142,7 +142,7 @@ TEST(ScaledDecode, EveryFormatHasTheExactSizeAndTheScalersPixelsOrClose) {
     TempFolder const folder;
     constexpr std::pair<int, int> kSizes[] = {{200, 150}, {100, 75}, {101, 3},   {25, 19},
                                               {1, 1},     {50, 300}, {400, 300}, {400, 20}};
-    Picture const noise = MakeTranslucentNoise(200, 150);
+    Picture const noise = MakeAlphaPattern(200, 150);
     Picture const smooth = MakeGradient(200, 150, true);
     struct {
         char const* extension;

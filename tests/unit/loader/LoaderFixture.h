@@ -25,7 +25,55 @@
 namespace Moka::Testing {
 
 using detail::BitmapLoaderImpl;
-using Pixels = std::vector<unsigned char>;
+
+using Events = std::vector<std::string>;
+
+// What a listener is told, in order: "pending", "load 1 5x4", "error 1", "save 1", "save error 1",
+// "completed".
+class RecordingListener : public BitmapLoaderInterface {
+public:
+    void OnLoad(int id, String const&, Bitmap& bitmap) override { Loaded(id, bitmap, &bitmap, nullptr); }
+    void OnLoad(int id, String const&, IMKBitmap& bitmap) override { Loaded(id, bitmap, nullptr, &bitmap); }
+    void OnLoadError(int id, String const&) override { Note("error " + std::to_string(id)); }
+    void OnSave(int id, String const&, void*) override { Note("save " + std::to_string(id)); }
+    void OnSaveError(int id, String const&, void*) override { Note("save error " + std::to_string(id)); }
+    void OnCallbackPending() override { Note("pending"); }
+    void OnCallbackCompleted() override { Note("completed"); }
+
+    Events GetEvents() const { return mEvents.Get(); }
+    // What became of one request after the other: the event between "pending" and "completed".
+    Events GetResults() const {
+        Events results = GetEvents();
+        auto const isFrame = [](std::string const& e) { return e == "pending" || e == "completed"; };
+        results.erase(std::remove_if(results.begin(), results.end(), isFrame), results.end());
+        return results;
+    }
+    // Until this many requests have been completed.
+    void AwaitCompleted(int count) const {
+        mEvents.Await([count](Events const& events) {
+            return std::count(events.begin(), events.end(), std::string("completed")) >= count;
+        });
+    }
+
+    std::function<void(Bitmap*, IMKBitmap*)> whenLoaded;
+    std::function<void(std::string const&)> whenNoted; // may throw
+
+private:
+    template <class Result>
+    void Loaded(int id, Result& result, Bitmap* cpu, IMKBitmap* graphics) {
+        if (whenLoaded) whenLoaded(cpu, graphics);
+        Note("load " + std::to_string(id) + " " + std::to_string(result.GetWidth()) + "x" +
+             std::to_string(result.GetHeight()));
+    }
+    // The listener may be gone as soon as the event is seen.
+    void Note(std::string const& event) {
+        auto const hook = whenNoted;
+        mEvents.Update([&](auto& events) { events.push_back(event); });
+        if (hook) hook(event);
+    }
+
+    Awaited<Events> mEvents;
+};
 
 class LoaderFixture : public ::testing::Test {
 protected:
@@ -84,58 +132,7 @@ protected:
     TempFolder folder;
     LogCapture log;
     std::unique_ptr<TracingThread> queue;
-};
-
-// What a listener is told, in order: "pending", "load 1 5x4", "error 1", "save 1", "save error 1",
-// "completed".
-class RecordingListener : public BitmapLoaderInterface {
-public:
-    void OnLoad(int id, String const&, Bitmap& bitmap) override { Loaded(id, bitmap, &bitmap, nullptr); }
-    void OnLoad(int id, String const&, IMKBitmap& bitmap) override { Loaded(id, bitmap, nullptr, &bitmap); }
-    void OnLoadError(int id, String const&) override { Note("error " + std::to_string(id)); }
-    void OnSave(int id, String const&, void* data) override { Saved("save ", id, data); }
-    void OnSaveError(int id, String const&, void* data) override { Saved("save error ", id, data); }
-    void OnCallbackPending() override { Note("pending"); }
-    void OnCallbackCompleted() override { Note("completed"); }
-
-    std::vector<std::string> GetEvents() const { return mEvents.Get(); }
-    // What became of one request after the other: the event between "pending" and "completed".
-    std::vector<std::string> GetResults() const {
-        std::vector<std::string> results = GetEvents();
-        auto const isFrame = [](std::string const& e) { return e == "pending" || e == "completed"; };
-        results.erase(std::remove_if(results.begin(), results.end(), isFrame), results.end());
-        return results;
-    }
-    // Until this many requests have been completed.
-    void AwaitCompleted(int count) const {
-        mEvents.Await([count](std::vector<std::string> const& events) {
-            return std::count(events.begin(), events.end(), std::string("completed")) >= count;
-        });
-    }
-
-    std::function<void(Bitmap*, IMKBitmap*)> whenLoaded;
-    std::function<void(std::string const&)> whenNoted; // may throw
-    void* userData = nullptr;
-
-private:
-    template <class Result>
-    void Loaded(int id, Result& result, Bitmap* cpu, IMKBitmap* graphics) {
-        if (whenLoaded) whenLoaded(cpu, graphics);
-        Note("load " + std::to_string(id) + " " + std::to_string(result.GetWidth()) + "x" +
-             std::to_string(result.GetHeight()));
-    }
-    void Saved(char const* what, int id, void* data) {
-        userData = data;
-        Note(what + std::to_string(id));
-    }
-    // The listener may be gone as soon as the event is seen.
-    void Note(std::string const& event) {
-        auto const hook = whenNoted;
-        mEvents.Update([&](auto& events) { events.push_back(event); });
-        if (hook) hook(event);
-    }
-
-    Awaited<std::vector<std::string>> mEvents;
+    RecordingListener listener;
 };
 
 // The callbacks of a front end of either kind, which tell the listener.
@@ -150,7 +147,5 @@ typename FrontEnd::Callback MakeCallback(RecordingListener& listener) {
     };
     return callback;
 }
-
-using Events = std::vector<std::string>;
 
 } // namespace Moka::Testing

@@ -26,9 +26,9 @@ public:
 
 class Save : public LoaderFixture {
 protected:
-    bool Request(int id, std::string const& name, int quality = 100, void* userData = nullptr) {
+    bool Request(int id, std::string const& name, int quality = 100) {
         return Loader().RequestSave(&listener, id, Path(name), NewPixels(image), image.width, image.height,
-                                    userData, quality);
+                                    nullptr, quality);
     }
     std::string EncodedDirectly(std::string const& extension, int quality = 100) {
         EXPECT_TRUE(SaveImage(image, folder.Path("direct." + extension), quality));
@@ -36,7 +36,6 @@ protected:
     }
 
     Picture image = MakeAlphaPattern(40, 30);
-    RecordingListener listener;
 };
 
 TEST_F(Save, WhatCannotBeWrittenIsAnErrorAndTheLoopGoesOn) {
@@ -46,19 +45,19 @@ TEST_F(Save, WhatCannotBeWrittenIsAnErrorAndTheLoopGoesOn) {
         EXPECT_TRUE(Loader().RequestSave(&listener, count++, Path("s.png"), NewPixels(image), width, height,
                                          nullptr, 100));
     }
-    {
-        listener.AwaitCompleted(count);
-        ThrowingCodecs const codecs;
-        EXPECT_TRUE(Request(count++, "s.png"));
-        listener.AwaitCompleted(count);
-    }
+    listener.AwaitCompleted(count);
+    codecsThrow = true;
+    EXPECT_TRUE(Request(count++, "s.png"));
+    listener.AwaitCompleted(count);
+    codecsThrow = false;
     EXPECT_FALSE(Exists("s.png"));
     Events expected;
     for (int i = 0; i < count; ++i) expected.push_back("save error " + std::to_string(i));
     expected.push_back("save " + std::to_string(count));
-    EXPECT_TRUE(Request(count, "s.png"));
+    EXPECT_TRUE(Request(count, "s.jpg", 30));
     listener.AwaitCompleted(count + 1);
     EXPECT_EQ(listener.GetResults(), expected);
+    EXPECT_EQ(ReadBytes("s.jpg"), EncodedDirectly("jpg", 30));
     EXPECT_EQ(log.Count(ANDROID_LOG_INFO, "BitmapLoaderImpl::SaveBitmap error bitmap construct fail"), 2);
 }
 

@@ -76,10 +76,17 @@ private:
     std::uint64_t mState = 1;
 };
 
-TEST(ArithmeticDigest, Matrix3) {
+// Of as many rounds of what add does with the numbers.
+template <class Add>
+void ExpectDigest(std::uint64_t expected, Add const& add) {
     Numbers numbers;
     Digest digest;
-    for (int i = 0; i < kRounds; ++i) {
+    for (int i = 0; i < kRounds; ++i) add(numbers, digest);
+    EXPECT_EQ(digest.Get(), expected);
+}
+
+TEST(ArithmeticDigest, Matrix3) {
+    ExpectDigest(0x8a900a57d492a392u, [](Numbers& numbers, Digest& digest) {
         auto m = numbers.NextMatrix<Matrix3f>();
         float const a = numbers.Next(), b = numbers.Next(), c = numbers.Next(), d = numbers.Next();
         digest.AddMatrix(m.inverse());
@@ -100,14 +107,11 @@ TEST(ArithmeticDigest, Matrix3) {
         Rect rounded;
         m.mapRect(&rounded, Rect(1, 2, 300, 400));
         digest.Add(rounded);
-    }
-    EXPECT_EQ(digest.Get(), 0x8a900a57d492a392u);
+    });
 }
 
 TEST(ArithmeticDigest, Matrix4) {
-    Numbers numbers;
-    Digest digest;
-    for (int i = 0; i < kRounds; ++i) {
+    ExpectDigest(0xae6ae3643eb169cdu, [](Numbers& numbers, Digest& digest) {
         auto const m = numbers.NextMatrix<Matrix4f>();
         auto const right = numbers.NextMatrix<Matrix4f>();
         auto const plane = numbers.NextMatrix<Matrix3f>();
@@ -123,14 +127,11 @@ TEST(ArithmeticDigest, Matrix4) {
         for (double term : terms) digest.Add(term);
         digest.AddMatrix(Matrix4f::orthoMatrix(a, b, c, d, -1, 1) * FromMatrix3(plane));
         digest.AddMatrix(Matrix4f::rotateMatrix(Vector3<float>{a, b, c}, Vector3<float>{c, a, b}));
-    }
-    EXPECT_EQ(digest.Get(), 0xae6ae3643eb169cdu);
+    });
 }
 
 TEST(ArithmeticDigest, Rectangles) {
-    Numbers numbers;
-    Digest digest;
-    for (int i = 0; i < kRounds; ++i) {
+    ExpectDigest(0x71d6a806567188c1u, [](Numbers& numbers, Digest& digest) {
         RectF r = numbers.NextRect();
         RectF const other = numbers.NextRect();
         float const a = numbers.Next(), b = numbers.Next();
@@ -142,16 +143,13 @@ TEST(ArithmeticDigest, Rectangles) {
         digest.Add(Rect(r).Intersect(Rect(other)));
         r.ExtendRect();
         digest.Add(r);
-    }
-    EXPECT_EQ(digest.Get(), 0x71d6a806567188c1u);
+    });
 }
 
 // With the C library's sine and cosine, which its versions for the processors agree about. About the tangent
 // they do not (the last bit, once in 150 values), so what takes it, the perspective, is left out.
 TEST(ArithmeticDigest, Angles) {
-    Numbers numbers;
-    Digest digest;
-    for (int i = 0; i < kRounds; ++i) {
+    ExpectDigest(0x1dcd91930b41b9c2u, [](Numbers& numbers, Digest& digest) {
         float const a = numbers.Next(), b = numbers.Next(), c = numbers.Next();
         auto m = Matrix3f::rotateMatrix(a);
         m.preRotate(b, c, a);
@@ -164,8 +162,7 @@ TEST(ArithmeticDigest, Angles) {
         space.rotateSelf(b, c, a);
         digest.AddMatrix(space);
         digest.AddMatrix(Matrix4f::rotateMatrix(a, Vector3<float>{b, c, a}));
-    }
-    EXPECT_EQ(digest.Get(), 0x1dcd91930b41b9c2u);
+    });
 }
 
 } // namespace

@@ -1,13 +1,10 @@
 // The scenes that come with the library: whole, well-formed, and complete.
-#include "moka/renderer/RendererFactory.h"
 #include "scenes/Picture.h"
 #include "scenes/SceneError.h"
 #include "scenes/SceneRenderer.h"
 #include "scenes/SceneTexts.h"
 #include "tests/support/LogCapture.h"
-#include "tests/support/Queues.h"
-#include "tests/support/RendererTrace.h"
-#include "tests/unit/scenes/ScenePainting.h"
+#include "tests/support/PumpedRenderer.h"
 
 #include <algorithm>
 #include <gmock/gmock.h>
@@ -56,10 +53,7 @@ TEST(SceneRegistry, TallScenesHaveExactlyThreeStrips) {
 
 // In so many operations of the scene's file.
 int CountOf(std::string const& scene, std::string const& part) {
-    auto const* const text =
-        std::find_if(Scenes::kSceneTexts, Scenes::kSceneTexts + Scenes::kSceneTextCount,
-                     [&](Scenes::SceneText const& candidate) { return scene == candidate.name; });
-    std::string const content = text->text;
+    std::string const& content = Scenes::FindScene(scene)->text;
     int count = 0;
     for (std::size_t at = 0; (at = content.find(part, at)) != std::string::npos; ++at) ++count;
     return count;
@@ -80,24 +74,19 @@ TEST(SceneRegistry, NothingTheLibraryKnowsIsLeftOut) {
 }
 
 TEST(SceneRenderer, WithoutRoomForItsPictureItThrows) {
-    RendererTrace::Reset();
-    ASSERT_TRUE(RendererFactory::AttachContext());
-    {
-        LogCapture const quiet;
-        HandPumpedQueue queue;
-        RendererTrace::FailCreations(ObjectKind::kTexture);
-        EXPECT_THROW(RenderScene(*Scenes::FindScene("rect-fractions"), queue), Scenes::SceneError);
-    }
-    RendererFactory::DetachContext();
-    RendererTrace::Reset();
+    LogCapture const quiet;
+    PumpedRenderer queue(64);
+    RendererTrace::FailCreations(ObjectKind::kTexture);
+    EXPECT_THROW(RenderScene(*Scenes::FindScene("rect-fractions"), queue), Scenes::SceneError);
+    RendererTrace::StopFailing();
 }
 
 TEST(ScenePictures, ArePremultipliedAtEverySizeDownToOnePixel) {
     EXPECT_EQ(Scenes::MakePicture(1, 8, 8).GetColor(0, 0),
-              (Color{236, 239, 244, 255})); // a light square, opaque
+              (Scenes::Color{236, 239, 244, 255})); // a light square, opaque
     for (std::size_t kind = 0; kind < Scenes::GetPictureNames().size(); ++kind) {
         for (auto const& [width, height] : {std::pair{1, 1}, {1, 7}, {200, 3}, {61, 67}}) {
-            Picture const picture = Scenes::MakePicture(kind, width, height);
+            Scenes::Picture const picture = Scenes::MakePicture(kind, width, height);
             ASSERT_EQ(picture.pixels.size(), picture.CountBytes());
             for (std::size_t i = 0; i < picture.pixels.size(); i += 4)
                 for (std::size_t channel = 0; channel < 3; ++channel)
