@@ -59,8 +59,11 @@ protected:
 TEST_F(ProgramTest, AttributesTakeTheirLocationsInTheOrderOfTheText) {
     ProgramPtr const program =
         MakeProgram("attribute vec2 zulu; // attribute float none;\n"
-                    "attribute mat3 matrix; attribute highp float mike, alpha;"
-                    "void main() { gl_Position = vec4(zulu, mike, alpha) + matrix[2].xyzx; }",
+                    "#define NONE attribute vec4 none;\n"
+                    "/*/ attribute vec4 gone; /*/ attribute/**/mat3 matrix;\n"
+                    "float f(const in float other) { vec4 attribute_ = vec4(other); return attribute_.x; }\n"
+                    "attribute highp float mike,alpha\n;"
+                    "void main() { gl_Position = vec4(zulu, mike, f(alpha)) + matrix[2].xyzx; }",
                     "void main() { gl_FragColor = vec4(1.0); }");
     GLuint const name = MakeCurrent(program);
     EXPECT_EQ(glGetAttribLocation(name, "zulu"), 0);
@@ -132,7 +135,7 @@ TEST_F(ProgramTest, SourcesThatDoNotCompileOrLinkMakeAProgramThatDrawsNothing) {
          "link"},
         {"", kUniformColor, ""},
         {nullptr, nullptr, ""},
-        {"uniform vec4 misspelt;", "{", ""},
+        {"/* never closed; uniform vec4 misspelt;", "{", ""},
     };
     for (auto const& [vertex, fragment, stage] : cases) {
         std::uint64_t const errors = Count().errors;

@@ -30,6 +30,7 @@ protected:
         RendererTrace::Reset();
         RendererFactory::AttachContext();
         RendererFactory::SetDeferred(true);
+        program = MakeProgram();
         program->MakeCurrent();
         width.reset(program->GetParameter("width"));
         texture = MakeTexture();
@@ -62,7 +63,7 @@ protected:
     static RendererStatistics Count() { return RendererFactory::GetStatistics(); }
 
     Released<IGraphicsObject> graphics;
-    Released<IShaderProgram> program = MakeProgram();
+    Released<IShaderProgram> program;
     std::unique_ptr<IParameterBinding> width;
     std::unique_ptr<ITextureObject> texture;
     Released<IRenderTarget> target;
