@@ -99,7 +99,7 @@ TEST_F(PixelBitmap, ASavedBitmapIsLoadedWithEveryPixelAndAMissingFileSaysWhy) {
 
     ASSERT_TRUE(thread->Call([&] {
         bool refuse = false;
-        RefusingQueue refusing(RefusingQueue::Predicate([&](int, ITask*) { return refuse; }));
+        HandPumpedQueue refusing([&](int, ITask*) { return refuse; });
         {
             auto const unread = NewBitmap(refusing, 4, 4);
             refuse = true; // as a queue that was stopped does

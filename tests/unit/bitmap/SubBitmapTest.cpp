@@ -108,22 +108,12 @@ TEST_F(SubBitmap, ACloneKeepsItsFrameBufferOnlyWhenTheSourceHasNone) {
 
 class FrameBuffer : public BitmapFixture {
 protected:
-    void SetUp() override {
-        BitmapFixture::SetUp();
-        RendererTrace::DeclareRenderThread();
-        strip = RefPtr<MKSubBitmapRT>::Adopt(
-            new MKSubBitmapRT(&queue, 0, Rect(0, 0, 4, 4), 4, 4, nullptr, false));
-    }
-    void TearDown() override {
-        strip = {};
-        RendererTrace::DeclareNoRenderThread();
-        BitmapFixture::TearDown();
-    }
-
     static int Targets() { return RendererFactory::GetStatistics().renderTargets; }
     static int Buffers() { return RendererFactory::GetStatistics().depthStencilBuffers; }
 
-    RefPtr<MKSubBitmapRT> strip;
+    OnRenderThread const here;
+    RefPtr<MKSubBitmapRT> strip =
+        RefPtr<MKSubBitmapRT>::Adopt(new MKSubBitmapRT(&queue, 0, Rect(0, 0, 4, 4), 4, 4, nullptr, false));
 };
 
 TEST_F(FrameBuffer, LivesFromTheFirstCanvasToTheLast) {

@@ -48,12 +48,6 @@ public:
 
 class CanvasFixture : public BitmapFixture {
 protected:
-    void TearDown() override {
-        canvas = {};
-        target = {};
-        BitmapFixture::TearDown();
-    }
-
     // The target and the canvas are these from now on, and everything so far has run and is forgotten.
     void Use(BitmapPtr const& bitmap) {
         target = bitmap;

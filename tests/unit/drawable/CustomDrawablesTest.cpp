@@ -18,20 +18,11 @@ class CustomDrawablesTest : public BitmapFixture {
 protected:
     using Maker = std::function<IMKCustomDrawable*(IGLMsgQueue*)>;
 
-    void SetUp() override {
-        BitmapFixture::SetUp();
-        first = NewBitmap(40, 20);
-        second = NewBitmap(8, 8);
+    CustomDrawablesTest() {
         queue.RunAll();
         OnRenderThread const here;
         RendererFactory::SetDeferred(true);
-        paint = CommonPaint();
         paint.SetTileMode(MKPaint::Repeat);
-    }
-    void TearDown() override {
-        first = {};
-        second = {};
-        BitmapFixture::TearDown();
     }
 
     MKBlendedBitmapDrawable* NewBlended(IGLMsgQueue* q, float width, float height) {
@@ -90,9 +81,9 @@ protected:
     static ITextureObject* TextureOf(BitmapPtr const& bitmap) { return StripOf(bitmap)->GetTexture(); }
 
     Matrix4<float> const projection{2, 0, 0, 0, 0, 3, 0, 0, 0, 0, 1, 0, -1, 0.5f, 0, 1};
-    MKPaint paint;
-    BitmapPtr first;
-    BitmapPtr second;
+    MKPaint paint = CommonPaint();
+    BitmapPtr first = NewBitmap(40, 20);
+    BitmapPtr second = NewBitmap(8, 8);
 };
 
 TEST_F(CustomDrawablesTest, GpuObjectsAreMadeAndReleasedByTasksInOrder) {
