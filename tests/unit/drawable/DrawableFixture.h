@@ -66,16 +66,15 @@ inline void ForceOtherStates() {
 // Shaders on the render thread. Every test ends with nothing alive that was not before, and nothing misused.
 class ShaderFixture : public ::testing::Test {
 protected:
-    void SetUp() override {
+    ShaderFixture() {
         RendererTrace::Reset();
-        ASSERT_TRUE(RendererFactory::AttachContext());
+        RendererFactory::AttachContext();
         expectedAlive = RendererTrace::CountLiveObjects();
     }
-
-    void TearDown() override {
+    // When the members of the fixtures that derive from it are gone.
+    ~ShaderFixture() override {
         EXPECT_EQ(RendererTrace::CountLiveObjects(), expectedAlive);
         EXPECT_THAT(RendererTrace::GetViolations(), ::testing::IsEmpty());
-        RendererFactory::DetachContext();
         RendererTrace::Reset();
     }
 
@@ -87,10 +86,7 @@ protected:
 class DrawableFixture : public ShaderFixture {
 protected:
     // Without a target, the state of an immediate renderer is the host's.
-    void SetUp() override {
-        ShaderFixture::SetUp();
-        RendererFactory::SetDeferred(true);
-    }
+    DrawableFixture() { RendererFactory::SetDeferred(true); }
 
     // Those since the last call.
     static std::vector<TracedDraw> TakeDraws() {

@@ -11,7 +11,6 @@
 
 #include <functional>
 #include <memory>
-#include <optional>
 
 namespace Moka::Testing {
 namespace {
@@ -69,35 +68,22 @@ TEST_F(DrawableFixture, EveryDrawAppliesThePaintAndItsOwnStatesAndThinLinesLeave
 
 class BitmapDrawableTest : public DrawableFixture {
 protected:
-    void SetUp() override {
-        DrawableFixture::SetUp();
-        bitmap =
-            RefPtr<IMKBitmap>::Adopt(MKGraphicsFactory::CreateBitmap(&queue, 8, 4, nullptr, false, 0, false));
-        readable = bitmap->GetBitmapReadable();
-        drawable.emplace(&queue);
-        RendererTrace::TakeCalls();
-    }
-    void TearDown() override {
-        drawable.reset();
-        bitmap = {};
-        EXPECT_EQ(queue.GetPostedCount(), 0);
-        DrawableFixture::TearDown();
-    }
-
     // Alone and in a batch.
     std::vector<TracedDraw> Draw(RectF const& bounds, RectF const& src, MKPaint const& paint) {
+        MKBitmapDrawable drawable(&queue);
+        IMKBitmapReadable* const readable = bitmap->GetBitmapReadable();
         std::vector<RectF> const dsts = {RectF(0, 0, 5, 5)};
-        EXPECT_TRUE(drawable->DrawBitmapRT(readable, bounds, bounds, src, dsts[0], projection, paint));
-        EXPECT_TRUE(drawable->DrawBitmapsRT(readable, bounds, bounds, src, &dsts, projection, paint));
+        EXPECT_TRUE(drawable.DrawBitmapRT(readable, bounds, bounds, src, dsts[0], projection, paint));
+        EXPECT_TRUE(drawable.DrawBitmapsRT(readable, bounds, bounds, src, &dsts, projection, paint));
+        EXPECT_EQ(queue.GetPostedCount(), 0);
         std::vector<TracedDraw> draws = TakeDraws();
         EXPECT_EQ(draws.size(), 2u);
         return draws;
     }
 
     HandPumpedQueue queue;
-    RefPtr<IMKBitmap> bitmap;
-    IMKBitmapReadable* readable = nullptr;
-    std::optional<MKBitmapDrawable> drawable;
+    RefPtr<IMKBitmap> bitmap =
+        RefPtr<IMKBitmap>::Adopt(MKGraphicsFactory::CreateBitmap(&queue, 8, 4, nullptr, false, 0, false));
 };
 
 // Its left edge is added on the right.
@@ -112,8 +98,6 @@ TEST_F(BitmapDrawableTest, TheDrawUsesThePaintAndTheBitmapAndLeavesTheStencilAlo
     // One GPU gets a program that clamps colours.
     for (std::string const gpu : {"Mali-T830", "Mali-T830 MP2", "Mali-T83"}) {
         RendererTrace::SetGpuName(gpu.c_str());
-        drawable.reset();
-        drawable.emplace(&queue);
         ForceOtherStates();
         for (TracedDraw const& draw : Draw(RectF(0, 0, 8, 4), RectF(2, 1, 6, 3), CommonPaint())) {
             EXPECT_EQ(draw.shader, gpu == "Mali-T830" ? "MKBitmapShaderColorClamp" : "MKBitmapShader");
