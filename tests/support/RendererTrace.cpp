@@ -66,7 +66,7 @@ PipelineState ReadState(RequestedState& state) {
 // What a reset forgets.
 struct Notes {
     bool keepsRecords = true;
-    std::vector<TracedCall> calls;
+    std::vector<std::string> calls;
     std::vector<TracedEvent> events;
     std::vector<std::string> violations;
     int creations = 0;
@@ -191,13 +191,13 @@ private:
     }
 
     // Writes the request down and looks whether it may come now.
-    void Note(ObjectKind kind, void const* address, std::string_view operation, std::string arguments) {
+    void Note(ObjectKind kind, void const* address, std::string_view operation,
+              std::string const& arguments) {
         TracedObject const* const object = Find(address);
-        std::string const who = object ? object->GetName() : NameOfKind(kind);
-        if (notes.keepsRecords) notes.calls.push_back({who, std::string(operation), std::move(arguments)});
-        auto const violate = [&](char const* what) {
-            notes.violations.push_back(who + " " + std::string(operation) + what);
-        };
+        std::string const call =
+            (object ? object->GetName() : NameOfKind(kind)) + " " + std::string(operation);
+        if (notes.keepsRecords) notes.calls.push_back(call + (arguments.empty() ? "" : " " + arguments));
+        auto const violate = [&](char const* what) { notes.violations.push_back(call + what); };
         bool const isReleased = address && (!object || object->released);
         // A handle may outlive its program.
         if (isReleased && operation != "ReleaseParameter") return violate(" after its release");
@@ -265,10 +265,6 @@ void SetCaps(DeviceCaps const& caps) {
 
 } // namespace
 
-std::string ToString(TracedCall const& call) {
-    return call.object + " " + call.operation + (call.arguments.empty() ? "" : " " + call.arguments);
-}
-
 void RendererTrace::Reset() {
     RendererFactory::DetachContext();
     SetCaps(TracingDevice::MakeCaps());
@@ -277,21 +273,7 @@ void RendererTrace::Reset() {
     trace->notes = {};
 }
 
-std::vector<TracedCall> RendererTrace::GetCalls() { return Access()->notes.calls; }
-
-std::vector<std::string> RendererTrace::TakeCalls() {
-    Access const trace;
-    std::vector<std::string> lines;
-    for (TracedCall const& call : std::exchange(trace->notes.calls, {})) lines.push_back(ToString(call));
-    return lines;
-}
-
-int RendererTrace::CountCalls(std::string const& operation) {
-    std::vector<TracedCall> const calls = GetCalls();
-    return static_cast<int>(std::count_if(
-        calls.begin(), calls.end(), [&](TracedCall const& call) { return call.operation == operation; }));
-}
-
+std::vector<std::string> RendererTrace::TakeCalls() { return std::exchange(Access()->notes.calls, {}); }
 std::vector<TracedDraw> RendererTrace::GetDraws() { return GetEventsOf<TracedDraw>(); }
 std::vector<TracedClear> RendererTrace::GetClears() { return GetEventsOf<TracedClear>(); }
 std::vector<TracedEvent> RendererTrace::TakeEvents() { return std::exchange(Access()->notes.events, {}); }

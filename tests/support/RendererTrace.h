@@ -65,20 +65,6 @@ struct TracedClear {
 
 using TracedEvent = std::variant<TracedDraw, TracedClear>;
 
-// One request. Objects are named by kind and number in order of creation: "texture 1", "target 1", "buffer 1",
-// "program 1", "graphics 1", "blend 1", "depthstencil 1"; static functions belong to "renderer", those of the
-// scissor to "rasterizer". Operations are named as in the interfaces; the deletion of a texture is its
-// "Release", a creation is the new object's "Create"; what is done to a handle on a parameter is an operation
-// of its program: "program 1 SetParameter uFactor 0.5", "program 1 ReleaseParameter uFactor".
-struct TracedCall {
-    std::string object;
-    std::string operation;
-    std::string arguments; // separated by spaces
-};
-
-// "texture 1 SetParameter 4 1"
-std::string ToString(TracedCall const& call);
-
 class RendererTrace {
 public:
     // Back to the beginning: no context, no calls, no violations, no planned failures, the usual capabilities,
@@ -86,10 +72,13 @@ public:
     // context, if there is one.
     static void Reset();
 
-    static std::vector<TracedCall> GetCalls();
-    // The calls as lines, which are then forgotten.
+    // The requests so far, which are then forgotten: "texture 1 SetParameter 4 1". Objects are named by kind and number
+    // in order of creation: "texture 1", "target 1", "buffer 1", "program 1", "graphics 1", "blend 1", "depthstencil 1";
+    // static functions belong to "renderer", those of the scissor to "rasterizer". Operations are named as in the
+    // interfaces; the deletion of a texture is its "Release", a creation is the new object's "Create"; what is done to a
+    // handle on a parameter is an operation of its program: "program 1 SetParameter uFactor 0.5", "program 1
+    // ReleaseParameter uFactor".
     static std::vector<std::string> TakeCalls();
-    static int CountCalls(std::string const& operation);
 
     // The draws and the clears, as values, in order. A draw without a current program is none, one of no vertices is
     // one.

@@ -104,9 +104,8 @@ protected:
     std::vector<std::string> TakeCalls(std::string const& operation) {
         queue.RunAll();
         std::vector<std::string> calls;
-        for (TracedCall const& call : RendererTrace::GetCalls())
-            if (call.operation == operation) calls.push_back(ToString(call));
-        RendererTrace::TakeCalls();
+        for (std::string const& call : RendererTrace::TakeCalls())
+            if (call.find(" " + operation) != std::string::npos) calls.push_back(call);
         return calls;
     }
 

@@ -95,11 +95,6 @@ protected:
             if (auto const* draw = std::get_if<TracedDraw>(&event)) draws.push_back(*draw);
         return draws;
     }
-    static TracedDraw TakeDraw() {
-        std::vector<TracedDraw> const draws = TakeDraws();
-        EXPECT_EQ(draws.size(), 1u);
-        return draws.empty() ? TracedDraw() : draws.back();
-    }
 
     // What CommonPaint and the projection must have become, whoever draws.
     static void ExpectCommonState(TracedDraw const& draw) {

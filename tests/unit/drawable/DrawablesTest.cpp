@@ -53,17 +53,15 @@ TEST_F(DrawableFixture, EveryDrawAppliesThePaintAndItsOwnStatesAndThinLinesLeave
         EXPECT_FALSE(each.state.depthStencil.IsStencil() || each.state.depthStencil.IsDepth());
     }
     paint.ClearTintColor();
-    for (TracedDraw const& each : draw()) EXPECT_EQ(Values(each, {"uHasTintColor"}), "0");
     paint.SetXFermode(static_cast<MKPaint::XFermode>(19)); // any other number is source over
-    for (TracedDraw const& each : draw())
+    for (TracedDraw const& each : draw()) {
+        EXPECT_EQ(Values(each, {"uHasTintColor"}), "0");
         EXPECT_EQ(each.state.blend.GetColorEquation().destination, BlendingFactor::OneMinusSrcAlpha);
+    }
     auto const points = std::make_unique<std::vector<PointF>>(4);
     MKPaint thin;
     thin.SetLineWidth(0.9f);
     line.DrawSimpleLinesRT(points.get(), projection, thin); // they stay ours
-    paint.SetXFermode(MKPaint::BlendingOff);
-    rect.DrawRectRT(RectF(2, 2, 12, 12), projection, paint);
-    EXPECT_FALSE(TakeDraw().state.blend.IsBlending());
 }
 
 class BitmapDrawableTest : public DrawableFixture {
