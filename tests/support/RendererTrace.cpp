@@ -73,7 +73,6 @@ struct Notes {
     std::set<int> failingCreations;
     std::set<ObjectKind> failingKinds;
     std::map<ObjectKind, int> lastNumber;
-    std::map<int, void const*> boundTextures;
 };
 
 // Everything that is known, under one lock: an operation that the renderer calls takes it, the others are for its
@@ -104,7 +103,6 @@ public:
         Note(request.kind, request.object, request.operation, arguments.str());
         if (operation == "GetParameter") ++liveHandles;
         if (operation == "ReleaseParameter") --liveHandles;
-        if (operation == "Bind") notes.boundTextures[int(request.values.begin()->integer)] = request.object;
         if (operation == "Release") End(request.object);
     }
 
@@ -125,16 +123,13 @@ public:
         std::lock_guard const lock(mutex);
         if (!notes.keepsRecords) return;
         auto draw = MakeEvent<TracedDraw>(request.state, GetAttachedRecorder()->GetActive());
-        draw.primitive = request.primitive;
         std::ptrdiff_t const floats = std::ptrdiff_t{request.count} * request.floatsPerVertex;
         if (floats > 0) draw.vertices.assign(request.vertices, request.vertices + floats);
-        draw.floatsPerVertex = request.floatsPerVertex;
         draw.first = request.first;
         draw.count = request.count;
         draw.shader = request.state.GetProgram()->GetLabel();
         void const* const program = FindProgram(request.state);
         if (program) draw.uniforms = objects[program].values;
-        for (auto const& [unit, texture] : notes.boundTextures) draw.textures[unit] = NameOf(texture);
         notes.events.emplace_back(std::move(draw));
     }
 
@@ -217,10 +212,6 @@ private:
                 notes.violations.push_back(object->GetName() + " released while attached to " +
                                            NameOf(target));
             }
-        }
-        auto& bound = notes.boundTextures;
-        for (auto unit = bound.begin(); unit != bound.end();) {
-            unit = unit->second == address ? bound.erase(unit) : std::next(unit);
         }
         object->released = true;
         if (!notes.keepsRecords) objects.erase(address);
@@ -322,8 +313,6 @@ void RendererTrace::StopFailing() {
 void RendererTrace::DeclareRenderThread() { Access()->renderThread = std::this_thread::get_id(); }
 void RendererTrace::DeclareNoRenderThread() { Access()->renderThread = {}; }
 
-std::string RendererTrace::NameOf(void const* object) { return Access()->NameOf(object); }
-
 std::vector<unsigned char> RendererTrace::GetTexels(ITextureObject const* texture) {
     TextureStorage const& storage = *static_cast<TextureObject const*>(texture)->GetStorage();
     Recorder& recorder = *storage.GetRecorder();
@@ -339,7 +328,7 @@ int RendererTrace::GetParameter(ITextureObject const* texture, int id) {
 
 std::string RendererTrace::GetActiveTarget() {
     Recorder const* const recorder = GetAttachedRecorder();
-    return NameOf(recorder ? recorder->GetActive() : nullptr);
+    return Access()->NameOf(recorder ? recorder->GetActive() : nullptr);
 }
 
 int RendererTrace::CountLiveObjects() {
@@ -357,7 +346,6 @@ std::unique_ptr<Device> MakeDevice(RendererProcLoader, Counters& counters) {
     Testing::Access const trace;
     ++trace->context;
     trace->renderThread = std::this_thread::get_id();
-    trace->notes.boundTextures.clear();
     return std::make_unique<Testing::TracingDevice>(counters);
 }
 

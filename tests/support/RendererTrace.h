@@ -45,16 +45,13 @@ struct TracedUniform {
 
 struct TracedDraw {
     PipelineState state;
-    std::string target; // "target 1"; "none" when nothing is active
-    PrimitiveType primitive = PrimitiveType::TriangleList;
+    std::string target;          // "target 1"; "none" when nothing is active
     std::vector<float> vertices; // those drawn, first and count applied; empty when nothing was
-    int floatsPerVertex = 0;
-    int first = 0; // of the vertices handed over
-    int count = 0; // that were there and were drawn
+    int first = 0;               // of the vertices handed over
+    int count = 0;               // that were there and were drawn
 
     std::string shader;                            // the name its creator gave it
     std::map<std::string, TracedUniform> uniforms; // those ever set, by name
-    std::map<int, std::string> textures;           // "texture 1" by unit
 };
 
 struct TracedClear {
@@ -111,9 +108,6 @@ public:
     static void DeclareRenderThread(); // the calling thread
     static void DeclareNoRenderThread();
 
-    // The name in the calls, for a pointer to any interface of the renderer; "none" for null. Still valid after
-    // the object's release, until its memory is used again.
-    static std::string NameOf(void const* object);
     // The image, rows packed, in texture order.
     static std::vector<unsigned char> GetTexels(ITextureObject const* texture);
     // The value last set, or the initial one; -1 for an id that names no parameter.

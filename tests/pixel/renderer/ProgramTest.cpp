@@ -46,7 +46,12 @@ protected:
     Color Draw() {
         Clear(*mImage.target, kClear);
         RendererFactory::Commit();
-        DrawRawStrip({{2, {-1, -1, 1, -1, -1, 1, 1, 1}}});
+        GLfloat const corners[] = {-1, -1, 1, -1, -1, 1, 1, 1};
+        glBindBuffer(GL_ARRAY_BUFFER, 0);
+        glEnableVertexAttribArray(0);
+        glVertexAttribPointer(0, 2, GL_FLOAT, GL_FALSE, 0, corners);
+        glDrawArrays(GL_TRIANGLE_STRIP, 0, 4);
+        glDisableVertexAttribArray(0);
         RendererFactory::InvalidateState();
         Picture const image = Read(*mImage.target, 2, 2);
         EXPECT_EQ(image, MakeImage(2, 2, image.GetColor(0, 0)));
