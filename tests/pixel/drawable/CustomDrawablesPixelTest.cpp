@@ -6,6 +6,7 @@
 #include "moka/graphics/drawable/MKTextMaskBitmapDrawable.h"
 #include "moka/graphics/paint/MKPaint.h"
 #include "tests/pixel/RenderThreadFixture.h"
+#include "tests/support/reference/Blend.h"
 
 #include <GLES3/gl3.h>
 #include <dlfcn.h>
@@ -30,20 +31,12 @@ constexpr int kWidth = 8;
 constexpr int kHeight = 4;
 constexpr Color kBackground{10, 20, 30, 40};
 
-// Premultiplied, 0 ... 1.
-struct Rgba {
-    double r, g, b, a;
-};
 Rgba operator*(Rgba const& c, double factor) {
     return {c.r * factor, c.g * factor, c.b * factor, c.a * factor};
 }
 Rgba operator+(Rgba const& p, Rgba const& q) { return {p.r + q.r, p.g + q.g, p.b + q.b, p.a + q.a}; }
 Rgba Premultiplied(Vector4<float> const& c, double alpha) {
     return {double{c.x} * alpha, double{c.y} * alpha, double{c.z} * alpha, alpha};
-}
-
-Rgba FromBytes(Color const& c) {
-    return Rgba{double(c[0]), double(c[1]), double(c[2]), double(c[3])} * (1 / 255.0);
 }
 
 // What an image shows where each of its pixels lies on one of the target.
@@ -102,11 +95,10 @@ protected:
         for (int y = 0; y < kHeight; ++y) {
             for (int x = 0; x < kWidth; ++x) {
                 std::optional<Rgba> const wanted = reference(x + 0.5, y + 0.5);
-                Rgba const c = wanted.value_or(FromBytes(kBackground)) * 255;
-                Color const p = drawn.GetColor(x, y);
-                double const off = std::max(
-                    {std::abs(p[0] - c.r), std::abs(p[1] - c.g), std::abs(p[2] - c.b), std::abs(p[3] - c.a)});
-                ASSERT_LE(off, wanted ? 1 : 1e-6) << x << ", " << y << " is " << ::testing::PrintToString(p);
+                Color const seen = drawn.GetColor(x, y);
+                double const off = Distance(FromBytes(seen), wanted.value_or(FromBytes(kBackground)));
+                ASSERT_LE(off * 255, wanted ? 1 : 1e-6)
+                    << x << ", " << y << " is " << ::testing::PrintToString(seen);
             }
         }
     }

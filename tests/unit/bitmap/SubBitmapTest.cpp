@@ -94,6 +94,8 @@ TEST_F(SubBitmap, ACloneKeepsItsFrameBufferOnlyWhenTheSourceHasNone) {
     auto strip = MakeStrip(&queue, Rect(0, 0, 4, 4), &pixels);
     strip->SetTag("original");
     auto keeps = RefPtr<IMKSubBitmap>::Adopt(strip->Clone());
+    Pixels const later(64);
+    strip->UpdateBitmap(later.data(), 0); // which the clone does not see
     queue.RunAll();
     EXPECT_EQ(RendererTrace::GetTexels(keeps->GetTexture()), pixels);
     EXPECT_EQ(LabelOf(keeps->GetTexture()), "original");

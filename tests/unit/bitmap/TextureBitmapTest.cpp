@@ -91,6 +91,9 @@ TEST_F(TextureBitmap, ACloneMadeBeforeAnythingRanShowsTheImage) {
     EXPECT_EQ(CountOf(clone.Get()), 1);
     EXPECT_EQ(CountOf(parent.Get()), 2) << "the clone holds its parent";
     for (int i = 0; i < 3; ++i) EXPECT_EQ(CountOf(StripOf(parent, i)) + CountOf(StripOf(clone, i)), 2);
+    Pixels const other(pixels.size(), 7);
+    clone->GetTextureBitmap()->UpdateBitmap(other.data(), 0);
+    EXPECT_EQ(ReadAll(parent), other);
     clone->GetBitmapReadable()->SetTextureWrap(TextureWrapRepeat); // sampling is each one's own
     queue.RunAll();
     EXPECT_NE(RendererTrace::GetParameter(StripOf(parent)->GetTexture(), TextureParamWrappingS),
