@@ -66,7 +66,7 @@ public:
     static TaskName TakeTaskName() noexcept;
 
 private:
-    static void SetTaskName(char const* name) noexcept;
+    [[gnu::cold]] static void SetTaskName(char const* name) noexcept;
     static std::atomic<bool> theIsOn;
 };
 

@@ -2,6 +2,8 @@
 /// The default equations have the factors One and Zero: the source replaces the destination.
 #pragma once
 
+#include "moka/base/SameBits.h"
+
 namespace Moka {
 
 /// One byte each: a descriptor is compared and copied for every draw.
@@ -34,18 +36,20 @@ public:
     };
 
     /// True: blends and writes colour. False: does neither.
-    explicit BlendStateDescriptor(bool enabled) : mBlending(enabled), mColorWrite(enabled) {}
+    explicit constexpr BlendStateDescriptor(bool enabled) : mBlending(enabled), mColorWrite(enabled) {}
 
     /// Switches blending and colour writes separately.
-    void SetEnabled(bool blending, bool colorWrite) {
+    constexpr void SetEnabled(bool blending, bool colorWrite) {
         mBlending = blending;
         mColorWrite = colorWrite;
     }
     /// The blend equations of colour, and of alpha.
-    void SetColorEquation(BlendingFunction function, BlendingFactor source, BlendingFactor destination) {
+    constexpr void SetColorEquation(BlendingFunction function, BlendingFactor source,
+                                    BlendingFactor destination) {
         mColor = {function, source, destination};
     }
-    void SetAlphaEquation(BlendingFunction function, BlendingFactor source, BlendingFactor destination) {
+    constexpr void SetAlphaEquation(BlendingFunction function, BlendingFactor source,
+                                    BlendingFactor destination) {
         mAlpha = {function, source, destination};
     }
 
@@ -57,8 +61,8 @@ public:
 
     /// Compares all values.
     friend bool operator==(BlendStateDescriptor const& a, BlendStateDescriptor const& b) {
-        return a.mBlending == b.mBlending && a.mColorWrite == b.mColorWrite && a.mColor == b.mColor &&
-               a.mAlpha == b.mAlpha;
+        static_assert(sizeof(BlendStateDescriptor) == 8, "no padding is compared");
+        return detail::HasSameBits<sizeof(BlendStateDescriptor)>(&a, &b);
     }
 
 private:

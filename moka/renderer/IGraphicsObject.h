@@ -31,7 +31,7 @@ public:
     /// Optional. The box must enclose all pixels that draws of the current vertices cover. Such draws may be
     /// merged with earlier draws of their state, ahead of draws that they do not overlap. SetVertices resets
     /// the box.
-    virtual void SetBounds(DrawBounds const&) {}
+    virtual void SetBounds(DrawBounds) {}
 
 protected:
     ~IGraphicsObject() = default;

@@ -21,5 +21,5 @@ enum android_LogPriority {
 
 /// Returns the number of bytes written. A null tag or format is written as "(null)".
 extern "C" MOKA_API int __android_log_print(int priority, char const* tag, char const* format, ...)
-    __attribute__((format(printf, 3, 4)));
+    __attribute__((cold, format(printf, 3, 4)));
 #endif

@@ -13,14 +13,6 @@ MKFrameBuffer::~MKFrameBuffer() {
     if (mRenderTarget) mRenderTarget->Release();
 }
 
-void MKFrameBuffer::ActivateFrameBufferRT() {
-    if (mRenderTarget) mRenderTarget->Activate();
-}
-
-void MKFrameBuffer::DeactivateFrameBufferRT(bool discardColor, bool discardDepthStencil) {
-    if (mRenderTarget) mRenderTarget->Deactivate(discardColor, discardDepthStencil);
-}
-
 void MKFrameBuffer::AttachDepthStencilBufferRT(MKDepthStencilBuffer* buffer) {
     if (mRenderTarget) mRenderTarget->AttachDepthStencil(buffer->GetDepthStencilBuffer());
 }

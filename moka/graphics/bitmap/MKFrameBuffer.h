@@ -6,10 +6,10 @@
 
 #include "moka/base/Export.h"
 #include "moka/base/RefCount.h"
+#include "moka/renderer/IRenderTarget.h"
 
 namespace Moka {
 
-class IRenderTarget;
 class ITextureObject;
 class MKDepthStencilBuffer;
 
@@ -19,8 +19,12 @@ public:
     MKFrameBuffer(int width, int height, ITextureObject* texture);
     ~MKFrameBuffer() override;
 
-    void ActivateFrameBufferRT();
-    void DeactivateFrameBufferRT(bool discardColor, bool discardDepthStencil);
+    void ActivateFrameBufferRT() {
+        if (mRenderTarget) mRenderTarget->Activate();
+    }
+    void DeactivateFrameBufferRT(bool discardColor, bool discardDepthStencil) {
+        if (mRenderTarget) mRenderTarget->Deactivate(discardColor, discardDepthStencil);
+    }
     void AttachDepthStencilBufferRT(MKDepthStencilBuffer* buffer);
     void DetachDepthStencilBufferRT();
     void ClearColorRT(float r, float g, float b, float a);

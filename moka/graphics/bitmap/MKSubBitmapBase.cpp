@@ -1,5 +1,6 @@
 #include "moka/graphics/bitmap/MKSubBitmapBase.h"
 
+#include "moka/base/Likely.h"
 #include "moka/graphics/bitmap/MKDepthStencilBuffer.h"
 #include "moka/graphics/bitmap/MKFrameBuffer.h"
 #include "moka/renderer/IRenderTarget.h"
@@ -117,15 +118,17 @@ void MKSubBitmapBase::DetachStencilBufferRT(bool release) {
 }
 
 void MKSubBitmapBase::ActivateFrameBufferRT(bool release) {
-    if (MKFrameBuffer* const frameBuffer = mFrameBuffer) frameBuffer->ActivateFrameBufferRT();
-    if (release) Unref();
+    MKFrameBuffer* const frameBuffer = mFrameBuffer;
+    if (MOKA_LIKELY(frameBuffer)) frameBuffer->ActivateFrameBufferRT();
+    if (MOKA_UNLIKELY(release)) Unref();
 }
 
 void MKSubBitmapBase::DeactivateFrameBufferRT(bool release, DiscardFramebufferType discard) {
-    if (MKFrameBuffer* const frameBuffer = mFrameBuffer)
+    MKFrameBuffer* const frameBuffer = mFrameBuffer;
+    if (MOKA_LIKELY(frameBuffer))
         frameBuffer->DeactivateFrameBufferRT((discard & DiscardFramebufferColor) != 0,
                                              (discard & DiscardFramebufferDepthStencil) != 0);
-    if (release) Unref();
+    if (MOKA_UNLIKELY(release)) Unref();
 }
 
 void MKSubBitmapBase::ClearColorRT(float r, float g, float b, float a) {

@@ -109,7 +109,6 @@ void MKCanvasClipping::EnableStencil() {
 }
 
 void MKCanvasClipping::DisableClipRT() {
-    RendererFactory::SetStencilClip(false);
     if (mMode == Mode::Scissor)
         DisableScissor();
     else if (mMode == Mode::Stencil)
@@ -126,6 +125,7 @@ void MKCanvasClipping::DisableScissor() {
 }
 
 void MKCanvasClipping::DisableStencil() {
+    RendererFactory::SetStencilClip(false);
     DetachStencil(mActiveFrameBuffer);
     ApplyPlainState();
 }

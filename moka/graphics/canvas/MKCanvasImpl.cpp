@@ -1,5 +1,6 @@
 #include "moka/graphics/canvas/MKCanvasImpl.h"
 
+#include "moka/base/Likely.h"
 #include "moka/base/RefPtr.h"
 #include "moka/base/Trace.h"
 #include "moka/base/log/AndroidLog.h"
@@ -75,18 +76,18 @@ MKCanvasImpl::~MKCanvasImpl() {
 }
 
 // Iterates over the frame buffers that a shape can touch. Each is active and clipped until the next call of
-// Next():
+// Next(). shape and m must outlive it:
 //     for (Touched frame(*this, shape, m); frame.Next();) drawable->DrawRT(..., frame.GetProjection(),
 //     paint);
 class MKCanvasImpl::Touched {
 public:
     Touched(MKCanvasImpl& canvas, RectF const& shape, Matrix3<float> const& m)
-        : mCanvas(canvas), mShape(shape), mMatrix(m), mFrame(canvas.GetBitmap()) {}
+        : mCanvas(canvas), mShape(shape), mMatrix(m), mFrame(canvas) {}
 
     bool Next() {
         mDrawing.reset();
         while (mFrame.Next()) {
-            if (!Touches(mFrame.bounds, mShape, mMatrix)) continue;
+            if (MOKA_UNLIKELY(!Touches(mFrame.bounds, mShape, mMatrix))) continue;
             mDrawing.emplace(mCanvas.GetClipping(), mFrame.writable, mFrame.index);
             return true;
         }
@@ -98,7 +99,7 @@ public:
 
 private:
     MKCanvasImpl& mCanvas;
-    RectF const mShape;
+    RectF const& mShape;
     Matrix3<float> const& mMatrix;
     FrameBuffers mFrame;
     std::optional<Drawing> mDrawing;
@@ -118,7 +119,7 @@ void MKCanvasImpl::DrawRT(IMKCustomDrawable* drawable, Matrix3<float> const& m, 
     Trace::NameTask("DrawRT");
     auto const held = RefPtr<IMKCustomDrawable>::Adopt(drawable);
     if (!held) return;
-    for (FrameBuffers frame(GetBitmap()); frame.Next();) {
+    for (FrameBuffers frame(*this); frame.Next();) {
         Drawing const ready(GetClipping(), frame.writable, -1);
         // A custom drawable gets its own copy of the paint.
         drawable->DrawRT(frame.writable->GetProjectionMatrix() * FromMatrix3(m), MKPaint(paint));
@@ -131,7 +132,8 @@ void MKCanvasImpl::DrawLineRT(PointF const& a, PointF const& b, Matrix3<float> c
     if (DrawsNoLine(a, b, paint)) return;
     MKLineDrawable* const drawable = FindOrMake(mLineDrawable);
     if (!drawable) return;
-    for (Touched frame(*this, BoxOf(a, b), m); frame.Next();)
+    RectF const box = BoxOf(a, b);
+    for (Touched frame(*this, box, m); frame.Next();)
         drawable->DrawLineRT(a, b, frame.GetProjection(), paint);
 }
 
@@ -141,7 +143,8 @@ void MKCanvasImpl::DrawSimpleLineRT(PointF const& a, PointF const& b, Matrix3<fl
     if (DrawsNoLine(a, b, paint)) return;
     MKLineDrawable* const drawable = FindOrMake(mLineDrawable);
     if (!drawable) return;
-    for (Touched frame(*this, BoxOf(a, b), m); frame.Next();)
+    RectF const box = BoxOf(a, b);
+    for (Touched frame(*this, box, m); frame.Next();)
         drawable->DrawSimpleLineRT(a, b, frame.GetProjection(), paint);
 }
 

@@ -1,9 +1,9 @@
 #include "moka/graphics/canvas/MKCanvasImplBase.h"
 
+#include "moka/base/Likely.h"
 #include "moka/base/Trace.h"
 #include "moka/graphics/bitmap/IMKBitmapCanvasAttachable.h"
 #include "moka/graphics/bitmap/IMKSubBitmap.h"
-#include "moka/graphics/bitmap/IMKTextureBitmap.h"
 #include "moka/graphics/task/WorkerTask.h"
 #include "moka/renderer/RendererFactory.h"
 
@@ -11,9 +11,19 @@
 
 namespace Moka {
 
-MKCanvasImplBase::Target::Target(IMKBitmap* target, bool onRenderThread) : bitmap(target) {
+namespace {
+
+IMKBitmap* AddReference(IMKBitmap* bitmap) {
     bitmap->Ref();
-    IMKBitmapCanvasAttachable* const attachable = bitmap->GetBitmapCanvasAttachable();
+    return bitmap;
+}
+
+} // namespace
+
+MKCanvasImplBase::Target::Target(IMKBitmap* target, bool onRenderThread)
+    : bitmap(AddReference(target)),
+      strips(target->GetTextureBitmap()),
+      attachable(target->GetBitmapCanvasAttachable()) {
     if (attachable && onRenderThread)
         attachable->AttachToCanvasRT(false);
     else if (attachable)
@@ -21,33 +31,28 @@ MKCanvasImplBase::Target::Target(IMKBitmap* target, bool onRenderThread) : bitma
 }
 
 MKCanvasImplBase::Target::~Target() {
-    if (IMKBitmapCanvasAttachable* const attachable = bitmap->GetBitmapCanvasAttachable())
-        attachable->DetachFromCanvasRT(false);
+    if (attachable) attachable->DetachFromCanvasRT(false);
     bitmap->Unref();
 }
 
-MKCanvasImplBase::FrameBuffers::FrameBuffers(IMKBitmap* target)
-    : mTarget(target),
-      mStrips(target->GetTextureBitmap()),
-      mStripCount(mStrips ? mStrips->GetSubBitmapCount() : 0),
-      mAttachable(target->GetBitmapCanvasAttachable()) {}
-
-bool MKCanvasImplBase::FrameBuffers::Next() {
-    if (!mStrips) {
-        writable = mIsDone ? nullptr : mTarget->GetBitmapWritable();
-        mIsDone = true;
-        if (!writable || (mAttachable && !mAttachable->HasFrameBufferRT(-1))) return false;
-        bounds = RectF(mTarget->GetBitmapRect());
-        return true;
-    }
-    while (++index < mStripCount) {
-        IMKSubBitmap* const strip = mStrips->GetSubBitmap(index);
-        if (!strip || (mAttachable && !mAttachable->HasFrameBufferRT(index))) continue;
+bool MKCanvasImplBase::FrameBuffers::FindStrip() {
+    for (; index < mStripCount; ++index) {
+        IMKSubBitmap* const strip = mTarget.strips->GetSubBitmap(index);
+        bool const exists = strip && (!mTarget.attachable || mTarget.attachable->HasFrameBufferRT(index));
+        if (MOKA_UNLIKELY(!exists)) continue;
         writable = strip;
         bounds = RectF(strip->GetBitmapRect());
         return true;
     }
     return false;
+}
+
+bool MKCanvasImplBase::FrameBuffers::NextWhole() {
+    writable = mIsDone ? nullptr : mTarget.bitmap->GetBitmapWritable();
+    mIsDone = true;
+    if (!writable || (mTarget.attachable && !mTarget.attachable->HasFrameBufferRT(-1))) return false;
+    bounds = RectF(mTarget.bitmap->GetBitmapRect());
+    return true;
 }
 
 MKCanvasImplBase::Drawing::Drawing(MKCanvasClipping* clipping, IMKBitmapWritable* writable, int index)
@@ -82,14 +87,13 @@ void MKCanvasImplBase::createClippingRT() {
 }
 
 bool MKCanvasImplBase::HasFrameBuffer(int index) const {
-    IMKBitmapCanvasAttachable* const attachable = GetBitmap()->GetBitmapCanvasAttachable();
-    return !attachable || attachable->HasFrameBufferRT(index);
+    return !mTarget.attachable || mTarget.attachable->HasFrameBufferRT(index);
 }
 
 void MKCanvasImplBase::ClearRT(Vector4<float> const& rgba) {
     Trace::NameTask("ClearRT");
     bool const clipped = mClipping && mClipping->HasClips();
-    for (FrameBuffers frame(GetBitmap()); frame.Next();) {
+    for (FrameBuffers frame(*this); frame.Next();) {
         if (mClipping) mClipping->EnableClipRT(frame.index);
         frame.writable->ClearColorRT(rgba.x, rgba.y, rgba.z, rgba.w);
         if (mClipping) mClipping->DisableClipRT();
@@ -104,7 +108,7 @@ void MKCanvasImplBase::ClearAllRT(Vector4<float> const& rgba) {
     bool const scissored = rasterizer->IsScissorEnabled();
     ScissorRect const saved = scissored ? rasterizer->GetScissorRect() : ScissorRect{};
     rasterizer->SetScissorEnabled(false);
-    for (FrameBuffers frame(GetBitmap()); frame.Next();)
+    for (FrameBuffers frame(*this); frame.Next();)
         frame.writable->ClearColorRT(rgba.x, rgba.y, rgba.z, rgba.w);
     if (!scissored) return;
     // Restores the rectangle; the test stays off.

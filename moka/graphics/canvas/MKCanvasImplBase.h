@@ -11,6 +11,7 @@
 #include "moka/base/Rect.h"
 #include "moka/graphics/bitmap/IMKBitmap.h"
 #include "moka/graphics/bitmap/IMKBitmapWritable.h"
+#include "moka/graphics/bitmap/IMKTextureBitmap.h"
 #include "moka/graphics/canvas/ClipInfo.h"
 #include "moka/graphics/canvas/MKCanvasClipping.h"
 #include "moka/graphics/math/Vector.h"
@@ -20,7 +21,6 @@
 namespace Moka {
 
 class IMKBitmapCanvasAttachable;
-class IMKTextureBitmap;
 
 class MKCanvasImplBase : NonAssignable {
 public:
@@ -38,22 +38,38 @@ public:
     void RemoveClipRectRT(int count);
 
 protected:
+    // The bitmap and its interfaces, which never change.
+    struct Target {
+        Target(IMKBitmap* target, bool onRenderThread);
+        ~Target();
+        Target(Target const&) = delete;
+        Target& operator=(Target const&) = delete;
+
+        IMKBitmap* const bitmap;
+        IMKTextureBitmap* const strips;              // null for a target that is one frame buffer
+        IMKBitmapCanvasAttachable* const attachable; // may be null
+    };
+
     // Iterates over the existing frame buffers of the target:
-    //     for (FrameBuffers frame(bitmap); frame.Next();) frame.writable->...
+    //     for (FrameBuffers frame(*this); frame.Next();) frame.writable->...
     class FrameBuffers {
     public:
-        explicit FrameBuffers(IMKBitmap* target);
-        bool Next();
+        explicit FrameBuffers(MKCanvasImplBase const& canvas)
+            : mTarget(canvas.mTarget),
+              mStripCount(mTarget.strips ? mTarget.strips->GetSubBitmapCount() : 0) {}
+        bool Next() { return mTarget.strips ? ++index < mStripCount && FindStrip() : NextWhole(); }
 
         IMKBitmapWritable* writable = nullptr;
         RectF bounds;
         int index = -1; // the strip, or -1 for a target that is one frame buffer
 
     private:
-        IMKBitmap* const mTarget;
-        IMKTextureBitmap* const mStrips; // null for a target that is one frame buffer
+        // Finds the strip, or the next one that has a frame buffer.
+        bool FindStrip();
+        bool NextWhole();
+
+        Target const& mTarget;
         int const mStripCount;
-        IMKBitmapCanvasAttachable* const mAttachable;
         bool mIsDone = false; // Next() has returned the only frame buffer
     };
 
@@ -80,15 +96,6 @@ protected:
     bool HasFrameBuffer(int index) const;
 
 private:
-    struct Target {
-        Target(IMKBitmap* target, bool onRenderThread);
-        ~Target();
-        Target(Target const&) = delete;
-        Target& operator=(Target const&) = delete;
-
-        IMKBitmap* const bitmap;
-    };
-
     Target mTarget;
     std::unique_ptr<MKCanvasClipping> mClipping;
 };

@@ -59,31 +59,29 @@ void SetWrap(IMKBitmapReadable* bitmap, TextureParamWrapping axis, MKPaint::Tile
 
 constexpr int kModes = MKPaint::BlendingOff + 1;
 
-BlendStateDescriptor MakeDescriptor(Factors const& factors) {
+constexpr BlendStateDescriptor MakeDescriptor(Factors const& factors) {
     BlendStateDescriptor descriptor(true);
     descriptor.SetColorEquation(BlendingFunction::Add, factors.source, factors.destination);
     descriptor.SetAlphaEquation(BlendingFunction::Add, factors.sourceAlpha, factors.destinationAlpha);
     return descriptor;
 }
 
+// The descriptors are constants, because every draw needs one.
 template <std::size_t... kMode>
-std::array<BlendStateDescriptor, kModes> MakeDescriptors(std::index_sequence<kMode...>) {
+constexpr std::array<BlendStateDescriptor, kModes> MakeDescriptors(std::index_sequence<kMode...>) {
     BlendStateDescriptor off(true);
     off.SetEnabled(false, true);
     return {MakeDescriptor(kFactors[kMode])..., off};
 }
 
-// The descriptors are built once, because every draw needs one.
-std::array<BlendStateDescriptor, kModes> MakeDescriptors() {
-    return MakeDescriptors(std::make_index_sequence<MKPaint::BlendingOff>());
-}
+constexpr std::array<BlendStateDescriptor, kModes> kDescriptors =
+    MakeDescriptors(std::make_index_sequence<MKPaint::BlendingOff>());
 
 } // namespace
 
 BlendStateDescriptor MKGraphicsUtil::GetBlendingStateDescriptor(MKPaint::XFermode mode) {
-    static std::array<BlendStateDescriptor, kModes> const descriptors = MakeDescriptors();
     bool const isKnown = mode >= 0 && mode < kModes;
-    return descriptors[static_cast<std::size_t>(isKnown ? mode : MKPaint::SrcOver)];
+    return kDescriptors[static_cast<std::size_t>(isKnown ? mode : MKPaint::SrcOver)];
 }
 
 void MKGraphicsUtil::SetTileModeRT(IMKBitmapReadable* bitmap, MKPaint const& paint) {

@@ -104,7 +104,7 @@ Matrix3<T>::Matrix3(T const* elements) {
 }
 
 template <class T>
-bool Matrix3<T>::operator==(Matrix3 const& other) const {
+inline bool Matrix3<T>::operator==(Matrix3 const& other) const {
     constexpr std::size_t kLast = 8;
     return detail::HasSameBits<kLast * sizeof(T)>(mElements, other.mElements) &&
            std::memcmp(mElements + kLast, other.mElements + kLast, sizeof(T)) == 0;

@@ -32,7 +32,7 @@ public:
     }
 
 private:
-    void Grow(std::size_t needed) {
+    [[gnu::cold]] void Grow(std::size_t needed) {
         std::size_t const capacity = std::max(needed, 2 * mCapacity);
         std::unique_ptr<float[]> floats(new float[capacity]);
         if (mSize > 0) std::memcpy(floats.get(), mFloats.get(), mSize * sizeof(float));

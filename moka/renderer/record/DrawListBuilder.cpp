@@ -48,22 +48,16 @@ void DrawListBuilder::Align(std::size_t stride) {
     mEndVertex = static_cast<int>(end);
 }
 
-void DrawListBuilder::DropVertices(ListVertices const& vertices) {
-    if (!IsUndrawnEnd(vertices)) return;
+void DrawListBuilder::RemoveEnd(ListVertices const& vertices) {
     mList.vertices.resize(vertices.offset);
     mEndStride = vertices.stride;
     mEndVertex = vertices.first;
 }
 
-bool DrawListBuilder::IsUndrawnEnd(ListVertices const& vertices) const {
-    return Has(vertices) && vertices.offset >= mDrawnFloats &&
-           vertices.offset + vertices.size == mList.vertices.size();
-}
-
 void DrawListBuilder::AddDraw(RunState const& state, bool isKnownSame, ProgramState& program,
                               ListDraw const& draw) {
     ListVertices const& vertices = draw.vertices;
-    bool const isLast = isKnownSame && mLastState != kNoState;
+    bool const isLast = MOKA_LIKELY(isKnownSame && mLastState != kNoState);
     std::size_t const stateIndex = isLast ? mLastState : AddState(state);
     ProgramState::Listed const& listed = program.listed;
     bool const isListed = listed.list == mNumber && !listed.isStale;
@@ -125,10 +119,11 @@ std::size_t DrawListBuilder::AddValues(ProgramState& program) {
     return listed.offset;
 }
 
-DrawListBuilder::OpenRun* DrawListBuilder::FindRun(std::size_t state, DrawBounds const& bounds) {
+inline DrawListBuilder::OpenRun* DrawListBuilder::FindRun(std::size_t state, DrawBounds const& bounds) {
     // Joined triangle strips would be connected by unwanted triangles.
     if (mList.states[state].primitive != PrimitiveType::TriangleList) return nullptr;
-    if (mRunCount > mFirstOpenRun && mRuns[mRunCount - 1].state == state) return &mRuns[mRunCount - 1];
+    if (MOKA_LIKELY(mRunCount > mFirstOpenRun && mRuns[mRunCount - 1].state == state))
+        return &mRuns[mRunCount - 1];
     return mMerges ? FindEarlierRun(state, bounds) : nullptr;
 }
 
@@ -152,12 +147,12 @@ bool DrawListBuilder::MayTouch(OpenRun& run, DrawBounds const& bounds) {
     return run.bounds.MayTouch(bounds);
 }
 
-bool DrawListBuilder::Continues(OpenRun const& run, ProgramLayout const& layout, Record const& record,
-                                Continuation& how) const {
+inline bool DrawListBuilder::Continues(OpenRun const& run, ProgramLayout const& layout, Record const& record,
+                                       Continuation& how) const {
     Record const& last = mDraws[run.tail].record;
     how.isNext = last.first + last.count == record.first;
     how.isSame = last.values == record.values;
-    if (!how.isNext && (!mMerges || run.vertices + record.count > kMostGathered)) return false;
+    if (MOKA_UNLIKELY(!how.isNext) && (!mMerges || run.vertices + record.count > kMostGathered)) return false;
     if (how.isSame) return true;
     // Run::varying has one bit for each integer.
     std::size_t const integers = layout.integersEnd - layout.integersBegin;
@@ -168,8 +163,8 @@ bool DrawListBuilder::Continues(OpenRun const& run, ProgramLayout const& layout,
     return how.varying == 0 || run.varying != 0 || run.draws < kLongRun;
 }
 
-void DrawListBuilder::Join(OpenRun& run, Record const& record, DrawBounds const& bounds,
-                           Continuation const& how) {
+inline void DrawListBuilder::Join(OpenRun& run, Record const& record, DrawBounds const& bounds,
+                                  Continuation const& how) {
     if (how.isNext && how.isSame) {
         Draw& last = mDraws[run.tail];
         last.record.count += record.count;

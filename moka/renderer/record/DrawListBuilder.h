@@ -7,6 +7,7 @@
 // Fails:  throws bad_alloc. The list is then as it was before the call.
 #pragma once
 
+#include "moka/base/Likely.h"
 #include "moka/renderer/RendererStatistics.h"
 #include "moka/renderer/device/DrawList.h"
 #include "moka/renderer/record/RunBounds.h"
@@ -77,7 +78,9 @@ public:
     }
 
     // Removes the vertices if no draw uses them and they are the last ones in the list.
-    void DropVertices(ListVertices const& vertices);
+    void DropVertices(ListVertices const& vertices) {
+        if (MOKA_UNLIKELY(IsUndrawnEnd(vertices))) RemoveEnd(vertices);
+    }
 
     // The number of the current list. The first list is 1.
     std::uint64_t GetNumber() const { return mNumber; }
@@ -92,8 +95,8 @@ public:
     // True if the list is large enough to be flushed now, so that the GPU works while the CPU records the
     // rest.
     bool IsFull() const {
-        return mList.vertices.size() >= kFullFloats || mListedFloats >= 2 * kFullFloats ||
-               mList.commands.size() >= kFullCommands || mList.uniforms.size() >= kFullBytes;
+        return MOKA_UNLIKELY(mList.vertices.size() >= kFullFloats || mListedFloats >= 2 * kFullFloats ||
+                             mList.commands.size() >= kFullCommands || mList.uniforms.size() >= kFullBytes);
     }
     // Completes the list: puts the records and vertices of each run in order.
     DrawList const& Finish();
@@ -141,7 +144,11 @@ private:
         std::uint32_t varying = 0; // one bit for each integer that differs
     };
 
-    bool IsUndrawnEnd(ListVertices const& vertices) const;
+    bool IsUndrawnEnd(ListVertices const& vertices) const {
+        return Has(vertices) && vertices.offset >= mDrawnFloats &&
+               vertices.offset + vertices.size == mList.vertices.size();
+    }
+    void RemoveEnd(ListVertices const& vertices);
     void Align(std::size_t stride);
     std::size_t AddState(RunState const& state);
     std::size_t AddValues(ProgramState& program);

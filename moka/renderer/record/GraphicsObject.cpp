@@ -28,13 +28,13 @@ void GraphicsObject::SetVertices(int stream, void const* data, int count) {
     if (theObserver) theObserver->OnVertices(this, stream, data, count);
     mCount = 0;
     mBounds = {};
-    if (stream != 0 || count < 0 || (count > 0 && !data)) {
+    if (MOKA_UNLIKELY(stream != 0 || count < 0 || (count > 0 && !data))) {
         __android_log_print(ANDROID_LOG_ERROR, "mok_log",
                             "vertices are refused: stream %d (there is only 0), %d of them%s", stream, count,
                             data ? "" : ", no data");
         return;
     }
-    if (count == 0 || !mRecorder->Begin()) return;
+    if (MOKA_UNLIKELY(count == 0 || !mRecorder->Begin())) return;
     try {
         HandOver(static_cast<float const*>(data), count);
     } catch (std::bad_alloc const&) {
@@ -42,12 +42,12 @@ void GraphicsObject::SetVertices(int stream, void const* data, int count) {
     }
 }
 
-void GraphicsObject::HandOver(float const* data, int count) {
+inline void GraphicsObject::HandOver(float const* data, int count) {
     DrawListBuilder& list = mRecorder->list;
     // Without this, vertices that no draw uses could grow the list without limit.
     if (list.IsFull()) mRecorder->Flush();
     list.AddVertices(data, count, mFloatsPerVertex, mPlace);
-    if (mHeldList != mPlace.list) mRecorder->AddHolder(*this);
+    if (MOKA_UNLIKELY(mHeldList != mPlace.list)) mRecorder->AddHolder(*this);
     mHeldList = mPlace.list;
     mCount = count;
 }
@@ -56,7 +56,7 @@ bool GraphicsObject::Draw(int first, int count, int instances) {
     if (theObserver) Observe(ObjectKind::kGraphicsObject, this, "Draw", first, count, instances);
     RequestScope const scope(*mRecorder);
     if (!scope) return false;
-    if (instances != 1) {
+    if (MOKA_UNLIKELY(instances != 1)) {
         __android_log_print(ANDROID_LOG_ERROR, "mok_log", "a draw of %d instances is refused; pass 1",
                             instances);
         return false;
@@ -64,12 +64,7 @@ bool GraphicsObject::Draw(int first, int count, int instances) {
     int const start = std::clamp(first, 0, mCount);
     int const left = mCount - start;
     int const drawn = count < 0 ? left : std::min(count, left);
-    if (theObserver && mRecorder->requested->GetProgram()) {
-        float const* const vertices = GetVertices();
-        theObserver->OnDraw({*mRecorder->requested, this, mPrimitive,
-                             vertices ? vertices + std::ptrdiff_t{start} * mFloatsPerVertex : nullptr,
-                             mFloatsPerVertex, start, drawn});
-    }
+    if (theObserver) ObserveDraw(start, drawn);
     try {
         return mRecorder->Draw(*this, mFormat, mPrimitive, start, drawn);
     } catch (std::bad_alloc const&) {
@@ -79,7 +74,15 @@ bool GraphicsObject::Draw(int first, int count, int instances) {
     }
 }
 
-void GraphicsObject::SetBounds(DrawBounds const& bounds) { mBounds = bounds; }
+void GraphicsObject::ObserveDraw(int first, int count) const {
+    if (!mRecorder->requested->GetProgram()) return;
+    float const* const vertices = GetVertices();
+    theObserver->OnDraw({*mRecorder->requested, this, mPrimitive,
+                         vertices ? vertices + std::ptrdiff_t{first} * mFloatsPerVertex : nullptr,
+                         mFloatsPerVertex, first, count});
+}
+
+void GraphicsObject::SetBounds(DrawBounds bounds) { mBounds = bounds; }
 
 void GraphicsObject::Release() {
     Observe(ObjectKind::kGraphicsObject, this, "Release");
@@ -92,7 +95,7 @@ float const* GraphicsObject::GetVertices() const {
 }
 
 ListVertices const& GraphicsObject::PlaceVertices() {
-    if (!mRecorder->list.Has(mPlace)) {
+    if (MOKA_UNLIKELY(!mRecorder->list.Has(mPlace))) {
         mRecorder->list.AddVertices(mKept.data(), mCount, mFloatsPerVertex, mPlace);
     }
     return mPlace;

@@ -28,7 +28,7 @@ public:
     void SetVertices(int stream, void const* data, int count) override;
     bool Draw(int first, int count, int instances) override;
     void Release() override;
-    void SetBounds(DrawBounds const& bounds) override;
+    void SetBounds(DrawBounds bounds) override;
 
     DrawBounds const& GetBounds() const { return mBounds; }
     // Call this within a request. Copies the vertices into the current list unless they are there. Throws
@@ -45,6 +45,7 @@ public:
 
 private:
     void HandOver(float const* data, int count);
+    [[gnu::cold]] void ObserveDraw(int first, int count) const;
 
     std::shared_ptr<Recorder> const mRecorder;
     PrimitiveType const mPrimitive;

@@ -97,7 +97,8 @@ extern RecorderObserver* theObserver;
 
 // Functions that every draw calls test theObserver themselves, to save this call.
 template <class... Values>
-void Observe(ObjectKind kind, void const* object, char const* operation, Values const&... values) {
+[[gnu::cold, gnu::noinline]] void Observe(ObjectKind kind, void const* object, char const* operation,
+                                          Values const&... values) {
     if (theObserver) theObserver->OnRequest({kind, object, operation, {RequestValue(values)...}});
 }
 

@@ -6,6 +6,7 @@
 // Thread:  render thread. Release() may run on any thread.
 #pragma once
 
+#include "moka/base/Likely.h"
 #include "moka/renderer/device/ProgramLayout.h"
 #include "moka/renderer/record/UniformValue.h"
 
@@ -41,8 +42,8 @@ public:
     template <BindingType kType>
     bool SetAs(std::size_t handle, void const* value) {
         Handle const& place = mHandles[handle];
-        if (mIsReleased || place.type != kType) return false;
-        if (!ReplaceValue<kType>(mValues.data() + place.offset, value)) return false;
+        if (MOKA_UNLIKELY(mIsReleased || place.type != kType)) return false;
+        if (MOKA_LIKELY(!ReplaceValue<kType>(mValues.data() + place.offset, value))) return false;
         listed.isStale = true;
         return true;
     }

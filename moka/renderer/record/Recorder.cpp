@@ -67,12 +67,12 @@ void Recorder::End() {
 
 bool Recorder::Draw(GraphicsObject& object, int format, PrimitiveType primitive, int first, int count) {
     std::shared_ptr<ProgramState> const& program = requested->GetProgram();
-    if (!program || !program->CanDraw()) return false;
-    if (count <= 0) return true;
+    if (MOKA_UNLIKELY(!program || !program->CanDraw())) return false;
+    if (MOKA_UNLIKELY(count <= 0)) return true;
     ++counters.drawRequests;
     // A draw into the host's frame buffer uses the host's viewport, which the next activation changes.
     bool const isHosts = !mActive;
-    if (isHosts) {
+    if (MOKA_UNLIKELY(isHosts)) {
         Flush();
         mDevice->RestoreHost(HostState::All);
     }
@@ -81,14 +81,14 @@ bool Recorder::Draw(GraphicsObject& object, int format, PrimitiveType primitive,
         if (state.target.texture != 0) SampleCopyOfTarget(state);
         for (TextureRef const& texture : state.textures) UpdateMipmaps(texture);
     }
-    if (mStencils.IsPending() && TakeForStencil(state, object, first, count)) return true;
+    if (MOKA_UNLIKELY(mStencils.IsPending()) && TakeForStencil(state, object, first, count)) return true;
     BeforeDraw(state, object.GetBounds());
     mipmaps.Forget(state.target.texture);
     // PlaceVertices() must come last: a flush in the calls above would remove the vertices from the list.
     list.AddDraw(state, !requested->IsChanged(), *program,
                  {object.PlaceVertices(), first, count, object.GetBounds()});
     requested->SetChanged(false);
-    if (isHosts || mIsExternal || list.IsFull()) Flush();
+    if (MOKA_UNLIKELY(isHosts || mIsExternal) || list.IsFull()) Flush();
     return true;
 }
 
@@ -173,15 +173,15 @@ void Recorder::RemoveHolder(GraphicsObject const& object) {
 
 void Recorder::Activate(RenderTarget& target) {
     // External code may read the other target once this one is bound, so the draws into it are flushed first.
-    if (!mIsDeferred && mActive != &target) Flush();
+    if (MOKA_UNLIKELY(!mIsDeferred) && mActive != &target) Flush();
     mActive = &target;
-    if (mFlushesAtOnce) End();
+    if (MOKA_UNLIKELY(mFlushesAtOnce)) End();
 }
 
 void Recorder::Deactivate(RenderTarget const& target) {
-    if (mActive != &target) return;
+    if (MOKA_UNLIKELY(mActive != &target)) return;
     mActive = nullptr;
-    if (mIsDeferred) return;
+    if (MOKA_LIKELY(mIsDeferred)) return;
     Flush();
     CommitStates();
     mDevice->RestoreHost(HostState::All);

@@ -11,6 +11,7 @@
 #pragma once
 
 #include "moka/base/Check.h"
+#include "moka/base/Likely.h"
 #include "moka/renderer/device/Device.h"
 #include "moka/renderer/record/DepthStencilPool.h"
 #include "moka/renderer/record/DrawListBuilder.h"
@@ -54,10 +55,10 @@ public:
 
     // Call this at the beginning of each request. Returns false if the context is detached.
     bool Begin() {
-        if (!mAttached) return false;
+        if (MOKA_UNLIKELY(!mAttached)) return false;
         MOKA_CHECK(IsRenderThread(), "the renderer is used on the thread that attached it");
         // In deferred mode GL cannot have changed since the last request, so there is nothing to prepare.
-        if (mFlushesAtOnce || mHasDropped) Prepare();
+        if (MOKA_UNLIKELY(mFlushesAtOnce || mHasDropped)) Prepare();
         return true;
     }
     // Call this at the end of a request that may have bound a frame buffer. Binds the one that the caller
@@ -96,7 +97,7 @@ public:
     void CommitAtOnce(Commit commit) {
         if (IsThrough()) CommitNow(commit);
     }
-    bool IsThrough() const { return mFlushesAtOnce && list.IsEmpty(); }
+    bool IsThrough() const { return MOKA_UNLIKELY(mFlushesAtOnce) && list.IsEmpty(); }
 
     void Activate(RenderTarget& target);
     void Deactivate(RenderTarget const& target);
@@ -137,7 +138,7 @@ private:
     };
 
     template <class Commit>
-    void CommitNow(Commit commit) {
+    [[gnu::cold, gnu::noinline]] void CommitNow(Commit commit) {
         StateCommit state;
         commit(state);
         mDevice->Commit(state);
@@ -146,7 +147,7 @@ private:
     // True if no recorded or pending command refers to a name.
     bool IsIdle() const { return list.IsEmpty() && !mStencils.IsPending(); }
     bool MayDeleteNow() const { return mAttached && IsRenderThread() && IsIdle(); }
-    void Prepare();
+    [[gnu::cold]] void Prepare();
     void Delete(Dropped const& dropped);
     void DeleteDropped();
     bool TakeForStencil(RunState const& state, GraphicsObject& object, int first, int count);

@@ -34,8 +34,8 @@ void RenderTarget::Activate() {
 
 void RenderTarget::Deactivate(bool discardColor, bool discardDepthStencil) {
     if (theObserver) Observe(kTargetKind, this, "Deactivate", discardColor, discardDepthStencil);
-    if (!mRecorder->Begin() || mRecorder->GetActive() != this) return;
-    if (discardColor || discardDepthStencil) {
+    if (MOKA_UNLIKELY(!mRecorder->Begin() || mRecorder->GetActive() != this)) return;
+    if (MOKA_UNLIKELY(discardColor || discardDepthStencil)) {
         if (discardDepthStencil) mRecorder->ForgetStencil(mRef.depthStencil);
         mRecorder->list.Add(Discard{mRef, discardColor, discardDepthStencil});
     }

@@ -1,5 +1,6 @@
 #include "moka/renderer/record/RequestedState.h"
 
+#include "moka/base/Likely.h"
 #include "moka/renderer/device/Device.h"
 #include "moka/renderer/record/ProgramState.h"
 #include "moka/renderer/record/TextureStorage.h"
@@ -12,13 +13,6 @@ namespace Moka::detail {
 RequestedState::RequestedState(Device& device, int samplingUnits)
     : mDevice(device), mUnits(static_cast<std::size_t>(samplingUnits)) {
     mBound.reserve(mUnits.size());
-}
-
-void RequestedState::SetScissorEnabled(bool on) {
-    mKnowsScissorTest = true;
-    if (mDraw.scissor.on == on) return;
-    mDraw.scissor.on = on;
-    mChanged = true;
 }
 
 void RequestedState::SetScissorRect(ScissorRect const& rect) {
@@ -42,23 +36,8 @@ ScissorState const& RequestedState::GetScissor() {
     return mDraw.scissor;
 }
 
-void RequestedState::SetBlend(BlendStateDescriptor const& blend) {
-    mKnowsBlend = true;
-    if (mDraw.blend == blend) return;
-    mDraw.blend = blend;
-    mChanged = true;
-}
-
-void RequestedState::SetDepthStencil(DepthStencilStateDescriptor const& depthStencil) {
-    if (mStencilClip && !depthStencil.IsStencil()) return;
-    mKnowsDepthStencil = true;
-    if (mDraw.depthStencil == depthStencil) return;
-    mDraw.depthStencil = depthStencil;
-    mChanged = true;
-}
-
 void RequestedState::SetProgram(std::shared_ptr<ProgramState> const& program) {
-    if (mProgram == program) return;
+    if (MOKA_LIKELY(mProgram == program)) return;
     mProgram = program;
     mChanged = true;
 }
@@ -69,11 +48,11 @@ void RequestedState::SetTexture(int unit, std::shared_ptr<TextureStorage> const&
 }
 
 RunState& RequestedState::Resolve(TargetRef const& target, int format, PrimitiveType primitive) {
-    if (!mKnowsScissorTest || (mDraw.scissor.on && !mKnowsScissorRect)) GetScissor();
+    if (MOKA_UNLIKELY(!mKnowsScissorTest) || (mDraw.scissor.on && !mKnowsScissorRect)) GetScissor();
     DeviceName const program = mProgram->GetName();
     bool const isSame = mDraw.target == target && mDraw.format == format && mDraw.primitive == primitive &&
                         mDraw.program == program;
-    if (!isSame) {
+    if (MOKA_UNLIKELY(!isSame)) {
         mDraw.target = target;
         mDraw.format = format;
         mDraw.primitive = primitive;

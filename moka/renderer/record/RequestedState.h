@@ -6,6 +6,7 @@
 // states.
 #pragma once
 
+#include "moka/base/Likely.h"
 #include "moka/renderer/device/RunState.h"
 
 #include <memory>
@@ -22,16 +23,26 @@ class RequestedState {
 public:
     RequestedState(Device& device, int samplingUnits);
 
-    void SetScissorEnabled(bool on);
+    void SetScissorEnabled(bool on) {
+        mKnowsScissorTest = true;
+        Change(mDraw.scissor.on, on);
+    }
     // Negative sizes become 0.
     void SetScissorRect(ScissorRect const& rect);
     bool IsScissorEnabled();
     ScissorRect const& GetScissorRect();
     ScissorState const& GetScissor();
 
-    void SetBlend(BlendStateDescriptor const& blend);
+    void SetBlend(BlendStateDescriptor const& blend) {
+        mKnowsBlend = true;
+        Change(mDraw.blend, blend);
+    }
     // While a stencil clip is on, a state without a stencil test is ignored.
-    void SetDepthStencil(DepthStencilStateDescriptor const& depthStencil);
+    void SetDepthStencil(DepthStencilStateDescriptor const& depthStencil) {
+        if (MOKA_UNLIKELY(mStencilClip) && !depthStencil.IsStencil()) return;
+        mKnowsDepthStencil = true;
+        Change(mDraw.depthStencil, depthStencil);
+    }
     void SetStencilClip(bool on) { mStencilClip = on; }
     BlendStateDescriptor const& GetBlend() const { return mDraw.blend; }
     DepthStencilStateDescriptor const& GetDepthStencil() const { return mDraw.depthStencil; }
@@ -66,7 +77,7 @@ private:
 
     template <class T>
     void Change(T& kept, T const& value) {
-        if (kept == value) return;
+        if (MOKA_LIKELY(kept == value)) return;
         kept = value;
         mChanged = true;
     }

@@ -32,10 +32,8 @@ public:
     }
 
 protected:
-    void ObserveValue(void const* value) const {
-        if (theObserver) {
-            theObserver->OnValue(mObject, mProgram->GetHandleName(mHandle), GetType(), value);
-        }
+    [[gnu::cold, gnu::noinline]] void ObserveValue(void const* value) const {
+        theObserver->OnValue(mObject, mProgram->GetHandleName(mHandle), GetType(), value);
     }
 
     void CommitIfThrough() const {
@@ -63,7 +61,7 @@ class Parameter final : public ParameterBase {
 public:
     using ParameterBase::ParameterBase;
     void Set(void const* value) override {
-        ObserveValue(value);
+        if (theObserver) ObserveValue(value);
         if (mProgram->SetAs<kType>(mHandle, value)) CommitIfThrough();
     }
 };
@@ -73,7 +71,7 @@ class AnyParameter final : public ParameterBase {
 public:
     using ParameterBase::ParameterBase;
     void Set(void const* value) override {
-        ObserveValue(value);
+        if (theObserver) ObserveValue(value);
         if (mProgram->Set(mHandle, value)) CommitIfThrough();
     }
 };
@@ -134,8 +132,8 @@ void ShaderProgram::MakeCurrent() {
     IShaderProgram* const self = this;
     if (theObserver) Observe(kProgramKind, self, "MakeCurrent");
     Recorder* const recorder = GetAttachedRecorder();
-    if (!recorder || !recorder->Begin()) return;
-    if (mState->GetRecorder() != recorder) {
+    if (MOKA_UNLIKELY(!recorder || !recorder->Begin())) return;
+    if (MOKA_UNLIKELY(mState->GetRecorder() != recorder)) {
         try {
             mState->BuildIn(recorder->shared_from_this());
         } catch (std::bad_alloc const&) {

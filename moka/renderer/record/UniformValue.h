@@ -2,6 +2,7 @@
 // line because each draw calls one for each uniform, mostly with an equal value.
 #pragma once
 
+#include "moka/base/Likely.h"
 #include "moka/base/SameBits.h"
 #include "moka/renderer/device/ProgramLayout.h"
 
@@ -31,7 +32,7 @@ bool ReplaceValue(unsigned char* kept, void const* value) {
     } else if constexpr (kBytes == sizeof(std::uint32_t)) {
         return ReplaceWord(kept, value);
     } else {
-        if (HasSameBits<kBytes>(kept, value)) return false;
+        if (MOKA_LIKELY(HasSameBits<kBytes>(kept, value))) return false;
         std::memcpy(kept, value, kBytes);
         return true;
     }
