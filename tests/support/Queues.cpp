@@ -13,7 +13,7 @@ thread_local HandPumpedQueue const* tRunning = nullptr;
 bool HandPumpedQueue::Post(ITask* task) {
     std::lock_guard<std::mutex> lock(mMutex);
     if (!task) return true;
-    if (++mOffered; mRefuses && mRefuses(mOffered, task)) return false;
+    if (mRefuses && mRefuses()) return false;
     mTasks.emplace_back(task);
     ++mPosted;
     return true;

@@ -17,9 +17,8 @@ namespace Moka::Testing {
 // Fails:  an exception out of a task reaches the caller of Run...; the task is freed and counts as run.
 class HandPumpedQueue : public IGLMsgQueue {
 public:
-    // Whether a task is refused; ordinal counts the tasks offered, from 1. Asked under the queue's lock: it must not
-    // use the queue.
-    using Predicate = std::function<bool(int ordinal, ITask* task)>;
+    // Whether the next task is refused. Asked under the queue's lock: it must not use the queue.
+    using Predicate = std::function<bool()>;
 
     explicit HandPumpedQueue(Predicate refuses = {}) : mRefuses(std::move(refuses)) {}
 
@@ -53,7 +52,6 @@ private:
     Predicate const mRefuses;
     std::mutex mutable mMutex;
     std::deque<std::unique_ptr<ITask>> mTasks;
-    int mOffered = 0;
     int mRun = 0;
     int mPosted = 0;
     int mWaits = 0;

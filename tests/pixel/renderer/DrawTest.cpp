@@ -116,7 +116,7 @@ TEST_P(DrawTest, AnImageIsDrawnOntoItselfWithMoreVerticesThanAListHolds) {
     quad->SetVertices(0, corners.data(), 150000);
     EXPECT_TRUE(quad->Draw(0, -1, 1));
     Fill(kGreen, 0, 0, 2, 2);
-    EXPECT_EQ(Read(), With(Filled({200, 0, 0, 255}), {200, 255, 0, 255}, 0, 0, 2, 2));
+    EXPECT_EQ(Read(), Filled({200, 0, 0, 255}).With(0, 0, MakeImage(2, 2, {200, 255, 0, 255})));
     target->Deactivate(false, false);
     RendererFactory::Flush(); // takes the copy away
 }

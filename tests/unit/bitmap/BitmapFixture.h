@@ -93,7 +93,7 @@ protected:
     }
 
     bool refuse = false; // what the queue does with the next tasks
-    PumpedRenderer queue{kMaxSide, [this](int, ITask*) { return refuse; }};
+    PumpedRenderer queue{kMaxSide, [this] { return refuse; }};
 
 private:
     int const mAliveBefore = RendererTrace::CountLiveObjects(); // other tests leak on purpose
