@@ -67,14 +67,15 @@ TEST_F(ProgramTest, AttributesTakeTheirLocationsInTheOrderOfTheText) {
                     "#define NONE attribute vec4 none;\n"
                     "/*/ attribute vec4 gone; /*/ attribute/**/mat3 matrix;\n"
                     "float f(const in float other) { vec4 attribute_ = vec4(other); return attribute_.x; }\n"
-                    "attribute highp float mike,alpha\n;"
-                    "void main() { gl_Position = vec4(zulu, mike, f(alpha)) + matrix[2].xyzx; }",
+                    "attribute highp mat2 large; attribute highp float mike,alpha\n;"
+                    "void main() { gl_Position = vec4(zulu + large[1], mike, f(alpha)) + matrix[2].xyzx; }",
                     "void main() { gl_FragColor = vec4(1.0); }");
     GLuint const name = MakeCurrent(program);
     EXPECT_EQ(glGetAttribLocation(name, "zulu"), 0);
     EXPECT_EQ(glGetAttribLocation(name, "matrix"), 1);
-    EXPECT_EQ(glGetAttribLocation(name, "mike"), 4);
-    EXPECT_EQ(glGetAttribLocation(name, "alpha"), 5);
+    EXPECT_EQ(glGetAttribLocation(name, "large"), 4);
+    EXPECT_EQ(glGetAttribLocation(name, "mike"), 6);
+    EXPECT_EQ(glGetAttribLocation(name, "alpha"), 7);
 }
 
 // What arrives is seen in the scenes, which use every type but one.
