@@ -89,6 +89,9 @@ function(moka_compile_as_one name)
     endif()
   endforeach()
   set_target_properties(${name} PROPERTIES UNITY_BUILD ON UNITY_BUILD_MODE GROUP)
+  # Each function begins at a cache line. Otherwise a change of one function moves all that follow, and the time to record
+  # a rectangle varies by a fifth.
+  target_compile_options(${name} PRIVATE -falign-functions=64)
 endfunction()
 
 # moka_executable(NAME SOURCES ... LIBRARIES ...)

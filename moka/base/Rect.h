@@ -108,6 +108,8 @@ public:
 
 private:
     static bool OverlapsOnAxis(float lowA, float highA, float lowB, float highB) {
+        // The usual case. Comparisons with NaN are false.
+        if (lowA < highA && lowA < highB && lowB < highA && lowB < highB) return true;
         if (std::isunordered(lowA, highA) || std::isunordered(lowB, highB)) return false;
         float const low = std::max(lowA, lowB);
         float const high = std::min(highA, highB);

@@ -12,7 +12,6 @@
 
 #include <algorithm>
 #include <new>
-#include <optional>
 
 namespace Moka {
 namespace {
@@ -75,35 +74,16 @@ MKCanvasImpl::~MKCanvasImpl() {
     mBitmapDrawable.reset();
 }
 
-// Iterates over the frame buffers that a shape can touch. Each is active and clipped until the next call of
-// Next(). shape and m must outlive it:
-//     for (Touched frame(*this, shape, m); frame.Next();) drawable->DrawRT(..., frame.GetProjection(),
-//     paint);
-class MKCanvasImpl::Touched {
-public:
-    Touched(MKCanvasImpl& canvas, RectF const& shape, Matrix3<float> const& m)
-        : mCanvas(canvas), mShape(shape), mMatrix(m), mFrame(canvas) {}
-
-    bool Next() {
-        mDrawing.reset();
-        while (mFrame.Next()) {
-            if (MOKA_UNLIKELY(!Touches(mFrame.bounds, mShape, mMatrix))) continue;
-            mDrawing.emplace(mCanvas.GetClipping(), mFrame.writable, mFrame.index);
-            return true;
-        }
-        return false;
-    }
-
-    RectF const& Bounds() const { return mFrame.bounds; }
-    Matrix4<float> const& GetProjection() const { return mCanvas.Project(*mFrame.writable, mMatrix); }
-
-private:
-    MKCanvasImpl& mCanvas;
-    RectF const& mShape;
-    Matrix3<float> const& mMatrix;
-    FrameBuffers mFrame;
-    std::optional<Drawing> mDrawing;
-};
+// Calls draw(bounds, projection) for each frame buffer that the shape can touch, while it is active and
+// clipped. bounds is the frame buffer's part of the target.
+template <class Draw>
+void MKCanvasImpl::DrawWhereTouched(RectF const& shape, Matrix3<float> const& m, Draw const& draw) {
+    ForEachFrameBuffer([&](FrameBuffer const& frame) {
+        if (MOKA_UNLIKELY(!Touches(frame.bounds, shape, m))) return;
+        Drawing const ready(GetClipping(), frame.writable, frame.index);
+        draw(frame.bounds, Project(*frame.writable, m));
+    });
+}
 
 Matrix4<float> const& MKCanvasImpl::Project(IMKBitmapWritable& target, Matrix3<float> const& model) {
     Matrix4<float> const projection = target.GetProjectionMatrix();
@@ -119,11 +99,11 @@ void MKCanvasImpl::DrawRT(IMKCustomDrawable* drawable, Matrix3<float> const& m, 
     Trace::NameTask("DrawRT");
     auto const held = RefPtr<IMKCustomDrawable>::Adopt(drawable);
     if (!held) return;
-    for (FrameBuffers frame(*this); frame.Next();) {
+    ForEachFrameBuffer([&](FrameBuffer const& frame) {
         Drawing const ready(GetClipping(), frame.writable, -1);
         // A custom drawable gets its own copy of the paint.
         drawable->DrawRT(frame.writable->GetProjectionMatrix() * FromMatrix3(m), MKPaint(paint));
-    }
+    });
 }
 
 void MKCanvasImpl::DrawLineRT(PointF const& a, PointF const& b, Matrix3<float> const& m,
@@ -132,9 +112,9 @@ void MKCanvasImpl::DrawLineRT(PointF const& a, PointF const& b, Matrix3<float> c
     if (DrawsNoLine(a, b, paint)) return;
     MKLineDrawable* const drawable = FindOrMake(mLineDrawable);
     if (!drawable) return;
-    RectF const box = BoxOf(a, b);
-    for (Touched frame(*this, box, m); frame.Next();)
-        drawable->DrawLineRT(a, b, frame.GetProjection(), paint);
+    DrawWhereTouched(BoxOf(a, b), m, [&](RectF const&, Matrix4<float> const& projection) {
+        drawable->DrawLineRT(a, b, projection, paint);
+    });
 }
 
 void MKCanvasImpl::DrawSimpleLineRT(PointF const& a, PointF const& b, Matrix3<float> const& m,
@@ -143,9 +123,9 @@ void MKCanvasImpl::DrawSimpleLineRT(PointF const& a, PointF const& b, Matrix3<fl
     if (DrawsNoLine(a, b, paint)) return;
     MKLineDrawable* const drawable = FindOrMake(mLineDrawable);
     if (!drawable) return;
-    RectF const box = BoxOf(a, b);
-    for (Touched frame(*this, box, m); frame.Next();)
-        drawable->DrawSimpleLineRT(a, b, frame.GetProjection(), paint);
+    DrawWhereTouched(BoxOf(a, b), m, [&](RectF const&, Matrix4<float> const& projection) {
+        drawable->DrawSimpleLineRT(a, b, projection, paint);
+    });
 }
 
 void MKCanvasImpl::DrawSimpleLinesRT(std::vector<PointF>* points, Matrix3<float> const& m,
@@ -159,11 +139,10 @@ void MKCanvasImpl::DrawSimpleLinesRT(std::vector<PointF>* points, Matrix3<float>
     if (isFirst) LogLineDrawableCreated();
     // The drawable deletes the vector at every call, so each of several strips gets a copy.
     bool const once = IsOneFrameBuffer(GetBitmap());
-    RectF const box = BoxOf(*own);
-    for (Touched frame(*this, box, m); frame.Next();) {
+    DrawWhereTouched(BoxOf(*own), m, [&](RectF const&, Matrix4<float> const& projection) {
         std::vector<PointF>* const given = once ? own.release() : detail::CopyVector(*own).release();
-        if (given) drawable->DrawSimpleLinesRT(given, frame.GetProjection(), paint);
-    }
+        if (given) drawable->DrawSimpleLinesRT(given, projection, paint);
+    });
 }
 
 void MKCanvasImpl::DrawRectRT(RectF const& r, Matrix3<float> const& m, MKPaint const& paint) {
@@ -171,7 +150,9 @@ void MKCanvasImpl::DrawRectRT(RectF const& r, Matrix3<float> const& m, MKPaint c
     if (HasNoExtent(r)) return;
     MKRectDrawable* const drawable = FindOrMake(mRectDrawable);
     if (!drawable) return;
-    for (Touched frame(*this, r, m); frame.Next();) drawable->DrawRectRT(r, frame.GetProjection(), paint);
+    DrawWhereTouched(r, m, [&](RectF const&, Matrix4<float> const& projection) {
+        drawable->DrawRectRT(r, projection, paint);
+    });
 }
 
 void MKCanvasImpl::DrawRoundRectRT(RectF const& r, float rx, float ry, Matrix3<float> const& m,
@@ -180,8 +161,9 @@ void MKCanvasImpl::DrawRoundRectRT(RectF const& r, float rx, float ry, Matrix3<f
     if (HasNoExtent(r)) return;
     MKRoundRectDrawable* const drawable = FindOrMake(mRoundRectDrawable);
     if (!drawable) return;
-    for (Touched frame(*this, r, m); frame.Next();)
-        drawable->DrawRoundRectRT(r, rx, ry, frame.GetProjection(), paint);
+    DrawWhereTouched(r, m, [&](RectF const&, Matrix4<float> const& projection) {
+        drawable->DrawRoundRectRT(r, rx, ry, projection, paint);
+    });
 }
 
 void MKCanvasImpl::DrawCircleRT(PointF const& c, float radius, Matrix3<float> const& m,
@@ -192,8 +174,9 @@ void MKCanvasImpl::DrawCircleRT(PointF const& c, float radius, Matrix3<float> co
     if (!drawable) return;
     RectF box = BoxOf(c, c);
     box.IncreaseRect(radius, radius);
-    for (Touched frame(*this, box, m); frame.Next();)
-        drawable->DrawCircleRT(c, radius, frame.GetProjection(), paint);
+    DrawWhereTouched(box, m, [&](RectF const&, Matrix4<float> const& projection) {
+        drawable->DrawCircleRT(c, radius, projection, paint);
+    });
 }
 
 void MKCanvasImpl::DrawBitmapRT(IMKBitmap* src, RectF const& srcRect, RectF const& dstRect,
@@ -211,9 +194,10 @@ void MKCanvasImpl::DrawBitmapRT(IMKBitmap* src, RectF const& srcRect, RectF cons
 void MKCanvasImpl::DrawWhole(IMKBitmap* src, RectF const& srcRect, RectF const& dstRect,
                              Matrix3<float> const& m, MKPaint const& paint) {
     RectF const srcBounds(src->GetBitmapRect());
-    for (Touched frame(*this, dstRect, m); frame.Next();)
-        mBitmapDrawable->DrawBitmapRT(src->GetBitmapReadable(), srcBounds, frame.Bounds(), srcRect, dstRect,
-                                      frame.GetProjection(), paint);
+    DrawWhereTouched(dstRect, m, [&](RectF const& bounds, Matrix4<float> const& projection) {
+        mBitmapDrawable->DrawBitmapRT(src->GetBitmapReadable(), srcBounds, bounds, srcRect, dstRect,
+                                      projection, paint);
+    });
 }
 
 void MKCanvasImpl::DrawInPieces(IMKBitmap* src, RectF const& srcRect, RectF const& dstRect,
@@ -226,9 +210,10 @@ void MKCanvasImpl::DrawInPieces(IMKBitmap* src, RectF const& srcRect, RectF cons
         detail::SourcePiece piece;
         if (!strip || !detail::CutToStrip(strip->GetBitmapRect(), srcRect, dstRect, piece)) continue;
         RectF const stripBounds(strip->GetBitmapRect());
-        for (Touched frame(*this, piece.dst, m); frame.Next();)
-            mBitmapDrawable->DrawBitmapRT(strip, stripBounds, frame.Bounds(), piece.src, piece.dst,
-                                          frame.GetProjection(), clamped);
+        DrawWhereTouched(piece.dst, m, [&](RectF const& bounds, Matrix4<float> const& projection) {
+            mBitmapDrawable->DrawBitmapRT(strip, stripBounds, bounds, piece.src, piece.dst, projection,
+                                          clamped);
+        });
     }
 }
 

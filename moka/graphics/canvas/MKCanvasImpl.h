@@ -52,8 +52,6 @@ public:
                        Matrix3<float> const& m, MKPaint const& paint);
 
 private:
-    class Touched;
-
     // The matrices of the last draw and their product. Consecutive draws mostly use the same two matrices.
     struct Projection {
         Matrix4<float> target;
@@ -65,6 +63,8 @@ private:
     // valid until the next call.
     Matrix4<float> const& Project(IMKBitmapWritable& target, Matrix3<float> const& model);
 
+    template <class Draw>
+    void DrawWhereTouched(RectF const& shape, Matrix3<float> const& m, Draw const& draw);
     void DrawWhole(IMKBitmap* src, RectF const& srcRect, RectF const& dstRect, Matrix3<float> const& m,
                    MKPaint const& paint);
     void DrawInPieces(IMKBitmap* src, RectF const& srcRect, RectF const& dstRect, Matrix3<float> const& m,

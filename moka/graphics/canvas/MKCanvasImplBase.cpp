@@ -1,6 +1,5 @@
 #include "moka/graphics/canvas/MKCanvasImplBase.h"
 
-#include "moka/base/Likely.h"
 #include "moka/base/Trace.h"
 #include "moka/graphics/bitmap/IMKBitmapCanvasAttachable.h"
 #include "moka/graphics/bitmap/IMKSubBitmap.h"
@@ -35,24 +34,16 @@ MKCanvasImplBase::Target::~Target() {
     bitmap->Unref();
 }
 
-bool MKCanvasImplBase::FrameBuffers::FindStrip() {
-    for (; index < mStripCount; ++index) {
-        IMKSubBitmap* const strip = mTarget.strips->GetSubBitmap(index);
-        bool const exists = strip && (!mTarget.attachable || mTarget.attachable->HasFrameBufferRT(index));
-        if (MOKA_UNLIKELY(!exists)) continue;
-        writable = strip;
-        bounds = RectF(strip->GetBitmapRect());
-        return true;
-    }
-    return false;
+MKCanvasImplBase::FrameBuffer MKCanvasImplBase::GetStrip(int index) const {
+    IMKSubBitmap* const strip = mTarget.strips->GetSubBitmap(index);
+    if (!strip || !HasFrameBuffer(index)) return {};
+    return {strip, RectF(strip->GetBitmapRect()), index};
 }
 
-bool MKCanvasImplBase::FrameBuffers::NextWhole() {
-    writable = mIsDone ? nullptr : mTarget.bitmap->GetBitmapWritable();
-    mIsDone = true;
-    if (!writable || (mTarget.attachable && !mTarget.attachable->HasFrameBufferRT(-1))) return false;
-    bounds = RectF(mTarget.bitmap->GetBitmapRect());
-    return true;
+MKCanvasImplBase::FrameBuffer MKCanvasImplBase::GetWhole() const {
+    IMKBitmapWritable* const writable = mTarget.bitmap->GetBitmapWritable();
+    if (!writable || !HasFrameBuffer(-1)) return {};
+    return {writable, RectF(mTarget.bitmap->GetBitmapRect()), -1};
 }
 
 MKCanvasImplBase::Drawing::Drawing(MKCanvasClipping* clipping, IMKBitmapWritable* writable, int index)
@@ -93,13 +84,13 @@ bool MKCanvasImplBase::HasFrameBuffer(int index) const {
 void MKCanvasImplBase::ClearRT(Vector4<float> const& rgba) {
     Trace::NameTask("ClearRT");
     bool const clipped = mClipping && mClipping->HasClips();
-    for (FrameBuffers frame(*this); frame.Next();) {
+    ForEachFrameBuffer([&](FrameBuffer const& frame) {
         if (mClipping) mClipping->EnableClipRT(frame.index);
         frame.writable->ClearColorRT(rgba.x, rgba.y, rgba.z, rgba.w);
         if (mClipping) mClipping->DisableClipRT();
         // Clearing does not activate the frame buffer, but the clip did.
         if (clipped) frame.writable->DeactivateFrameBufferRT(false, DiscardFramebufferNone);
-    }
+    });
 }
 
 void MKCanvasImplBase::ClearAllRT(Vector4<float> const& rgba) {
@@ -108,8 +99,8 @@ void MKCanvasImplBase::ClearAllRT(Vector4<float> const& rgba) {
     bool const scissored = rasterizer->IsScissorEnabled();
     ScissorRect const saved = scissored ? rasterizer->GetScissorRect() : ScissorRect{};
     rasterizer->SetScissorEnabled(false);
-    for (FrameBuffers frame(*this); frame.Next();)
-        frame.writable->ClearColorRT(rgba.x, rgba.y, rgba.z, rgba.w);
+    ForEachFrameBuffer(
+        [&](FrameBuffer const& frame) { frame.writable->ClearColorRT(rgba.x, rgba.y, rgba.z, rgba.w); });
     if (!scissored) return;
     // Restores the rectangle; the test stays off.
     rasterizer->SetScissorEnabled(false);

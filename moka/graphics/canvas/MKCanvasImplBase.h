@@ -7,6 +7,7 @@
 //         draws are not clipped.
 #pragma once
 
+#include "moka/base/Likely.h"
 #include "moka/base/NonAssignable.h"
 #include "moka/base/Rect.h"
 #include "moka/graphics/bitmap/IMKBitmap.h"
@@ -38,40 +39,21 @@ public:
     void RemoveClipRectRT(int count);
 
 protected:
-    // The bitmap and its interfaces, which never change.
-    struct Target {
-        Target(IMKBitmap* target, bool onRenderThread);
-        ~Target();
-        Target(Target const&) = delete;
-        Target& operator=(Target const&) = delete;
-
-        IMKBitmap* const bitmap;
-        IMKTextureBitmap* const strips;              // null for a target that is one frame buffer
-        IMKBitmapCanvasAttachable* const attachable; // may be null
+    struct FrameBuffer {
+        IMKBitmapWritable* writable; // null if the frame buffer does not exist
+        RectF bounds;                // its part of the target
+        int index;                   // the strip, or -1 for a target that is one frame buffer
     };
 
-    // Iterates over the existing frame buffers of the target:
-    //     for (FrameBuffers frame(*this); frame.Next();) frame.writable->...
-    class FrameBuffers {
-    public:
-        explicit FrameBuffers(MKCanvasImplBase const& canvas)
-            : mTarget(canvas.mTarget),
-              mStripCount(mTarget.strips ? mTarget.strips->GetSubBitmapCount() : 0) {}
-        bool Next() { return mTarget.strips ? ++index < mStripCount && FindStrip() : NextWhole(); }
-
-        IMKBitmapWritable* writable = nullptr;
-        RectF bounds;
-        int index = -1; // the strip, or -1 for a target that is one frame buffer
-
-    private:
-        // Finds the strip, or the next one that has a frame buffer.
-        bool FindStrip();
-        bool NextWhole();
-
-        Target const& mTarget;
-        int const mStripCount;
-        bool mIsDone = false; // Next() has returned the only frame buffer
-    };
+    // Calls action(FrameBuffer const&) for each existing frame buffer of the target.
+    template <class Action>
+    void ForEachFrameBuffer(Action const& action) const {
+        int const count = mTarget.strips ? mTarget.strips->GetSubBitmapCount() : 1;
+        for (int i = 0; i < count; ++i) {
+            FrameBuffer const frame = mTarget.strips ? GetStrip(i) : GetWhole();
+            if (MOKA_LIKELY(frame.writable)) action(frame);
+        }
+    }
 
     // Activates a frame buffer and its clip for a scope.
     class Drawing {
@@ -96,6 +78,21 @@ protected:
     bool HasFrameBuffer(int index) const;
 
 private:
+    // The bitmap and its interfaces, which never change.
+    struct Target {
+        Target(IMKBitmap* target, bool onRenderThread);
+        ~Target();
+        Target(Target const&) = delete;
+        Target& operator=(Target const&) = delete;
+
+        IMKBitmap* const bitmap;
+        IMKTextureBitmap* const strips;              // null for a target that is one frame buffer
+        IMKBitmapCanvasAttachable* const attachable; // may be null
+    };
+
+    FrameBuffer GetStrip(int index) const;
+    FrameBuffer GetWhole() const;
+
     Target mTarget;
     std::unique_ptr<MKCanvasClipping> mClipping;
 };

@@ -12,7 +12,8 @@ namespace Moka::detail {
 
 // box is in units before the projection; its sides may be in any order. With perspective the result is
 // unknown.
-inline DrawBounds Project(RectF const& box, Matrix4<float> const& m) {
+inline DrawBounds Project(RectF const& box, Matrix4<float> const& projection) {
+    float const* const m = projection.data();
     if (m[3] != 0.0f || m[7] != 0.0f || m[15] != 1.0f) return {};
     float const x = (box.left + box.right) * 0.5f;
     float const y = (box.top + box.bottom) * 0.5f;

@@ -322,8 +322,8 @@ void Matrix3<T>::mapRect(Rect* result, Rect const& source) const {
 
 template <class T>
 void Matrix3<T>::mapRect(RectF* result, RectF const& source) const {
-    RectF const from = source; // result may point to source
-    MapCorners(mElements, from.left, from.top, from.right, from.bottom, *result);
+    // result may point to source: the sides are passed by value.
+    MapCorners(mElements, source.left, source.top, source.right, source.bottom, *result);
 }
 
 template class Matrix3<float>;

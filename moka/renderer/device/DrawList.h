@@ -2,8 +2,8 @@
 // Device::Submit executes it.
 #pragma once
 
+#include "moka/renderer/device/AppendBuffer.h"
 #include "moka/renderer/device/RunState.h"
-#include "moka/renderer/device/VertexBuffer.h"
 
 #include <cstdint>
 #include <variant>
@@ -84,8 +84,8 @@ struct DrawList {
     std::vector<Command> commands;
     std::vector<RunState> states;
     std::vector<Record> records;
-    std::vector<unsigned char> uniforms;
-    VertexBuffer vertices;
+    AppendBuffer<unsigned char> uniforms;
+    AppendBuffer<float> vertices;
 };
 
 } // namespace Moka::detail

@@ -18,7 +18,7 @@ int GlVertexFormats::Find(VertexDescriptor const& descriptor) {
 }
 
 // Allocates a new data store each time, so that the driver need not wait for draws that read the old one.
-void GlVertexFormats::Upload(VertexBuffer const& vertices) {
+void GlVertexFormats::Upload(AppendBuffer<float> const& vertices) {
     if (mBuffer == 0) {
         Gl::GenBuffers(1, &mBuffer);
         ++mState.counters.buffers;

@@ -4,7 +4,7 @@
 #pragma once
 
 #include "moka/renderer/VertexDescriptor.h"
-#include "moka/renderer/device/VertexBuffer.h"
+#include "moka/renderer/device/AppendBuffer.h"
 #include "moka/renderer/gles/GlFunctions.h"
 
 #include <vector>
@@ -21,7 +21,7 @@ public:
     int Find(VertexDescriptor const& descriptor);
 
     // Replaces the buffer's contents.
-    void Upload(VertexBuffer const& vertices);
+    void Upload(AppendBuffer<float> const& vertices);
     // Makes draws read the buffer in this layout.
     void Bind(int format);
     // Like Bind, but vertex 0 of a draw is vertex `first` of the buffer. Each vertex also reads its record

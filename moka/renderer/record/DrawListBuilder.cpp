@@ -23,25 +23,9 @@ std::uint32_t FindVarying(unsigned char const* a, unsigned char const* b, Progra
 
 } // namespace
 
-void DrawListBuilder::AddVertices(float const* vertices, int count, int stride, ListVertices& place) {
-    VertexBuffer& floats = mList.vertices;
-    DropVertices(place);
-    auto const step = static_cast<std::size_t>(stride);
-    if (mEndStride != step) Align(step);
-    std::size_t const size = static_cast<std::size_t>(count) * step;
-    std::size_t const offset = floats.size();
-    floats.Append(vertices, size);
-    place.list = mNumber;
-    place.offset = offset;
-    place.size = size;
-    place.stride = step;
-    place.first = mEndVertex;
-    mEndVertex += count;
-}
-
 // Pads the list to a multiple of the stride. Draws of one format leave no gap.
 void DrawListBuilder::Align(std::size_t stride) {
-    VertexBuffer& floats = mList.vertices;
+    AppendBuffer<float>& floats = mList.vertices;
     std::size_t const end = (floats.size() + stride - 1) / stride;
     floats.resize(end * stride);
     mEndStride = stride;
@@ -78,7 +62,7 @@ void DrawListBuilder::AddSeparateDraw(SeparateDraw const& draw) {
     ListVertices vertices;
     AddVertices(draw.vertices, draw.count, draw.stride, vertices);
     std::size_t const values = mList.uniforms.size();
-    mList.uniforms.insert(mList.uniforms.end(), draw.values, draw.values + draw.valueBytes);
+    mList.uniforms.Append(draw.values, draw.valueBytes);
     UseTexture(draw.state.target.texture);
     mList.states.push_back(draw.state);
     OpenNewRun(mList.states.size() - 1, {values, vertices.first, draw.count}, {}, vertices.stride);
@@ -113,7 +97,7 @@ std::size_t DrawListBuilder::AddValues(ProgramState& program) {
     ProgramState::Listed& listed = program.listed;
     std::vector<unsigned char> const& values = program.GetValues();
     listed.offset = mList.uniforms.size();
-    mList.uniforms.insert(mList.uniforms.end(), values.begin(), values.end());
+    mList.uniforms.Append(values.data(), values.size());
     listed.list = mNumber;
     listed.isStale = false;
     return listed.offset;
@@ -243,7 +227,7 @@ void DrawListBuilder::FinishRun(OpenRun const& run) {
 
 // Copies the run's vertices to the end of the list, in the order of its records.
 void DrawListBuilder::Gather(OpenRun const& run, Run& finished) {
-    VertexBuffer& floats = mList.vertices;
+    AppendBuffer<float>& floats = mList.vertices;
     std::size_t const begin = (floats.size() + run.stride - 1) / run.stride * run.stride;
     try {
         floats.resize(begin + static_cast<std::size_t>(run.vertices) * run.stride);

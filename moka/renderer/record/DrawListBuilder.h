@@ -57,7 +57,16 @@ public:
 
     // Copies the vertices to a multiple of their stride (in floats) and sets `place`. The vertices that
     // `place` named before are removed if no draw uses them and they are the last ones in the list.
-    void AddVertices(float const* vertices, int count, int stride, ListVertices& place);
+    void AddVertices(float const* vertices, int count, int stride, ListVertices& place) {
+        DropVertices(place);
+        auto const step = static_cast<std::size_t>(stride);
+        if (MOKA_UNLIKELY(mEndStride != step)) Align(step);
+        std::size_t const size = static_cast<std::size_t>(count) * step;
+        std::size_t const offset = mList.vertices.size();
+        mList.vertices.Append(vertices, size);
+        place = {mNumber, offset, size, step, mEndVertex};
+        mEndVertex += count;
+    }
     bool Has(ListVertices const& vertices) const { return vertices.list == mNumber; }
     float const* GetVertices(ListVertices const& vertices) const {
         return mList.vertices.data() + vertices.offset;

@@ -37,7 +37,7 @@ void Recorder::Detach() {
         // Names that another thread drops after this are not deleted: the GL context deletes them with
         // itself.
         std::lock_guard const lock(mDroppedLock);
-        mAttached = false;
+        mUnusual |= kDetached;
         for (Dropped const& dropped : mDropped) Delete(dropped);
         mDropped.clear();
     }
@@ -45,17 +45,19 @@ void Recorder::Detach() {
     mDevice.reset();
 }
 
-void Recorder::Prepare() {
+bool Recorder::Prepare() {
+    if (!IsAttached()) return false;
+    MOKA_CHECK(IsRenderThread(), "the renderer is used on the thread that attached it");
     bool const isHostsTurn = !mActive && !mIsDeferred;
     if (isHostsTurn || mIsExternal) {
         if (!mIsExternal) requested->Forget();
         mDevice->InvalidateState();
     }
-    if (mHasDropped && IsIdle()) DeleteDropped();
+    if (Has(kHasDropped) && IsIdle()) DeleteDropped();
+    return true;
 }
 
-void Recorder::End() {
-    if (!IsThrough()) return;
+void Recorder::BindExpected() {
     if (mActive) {
         StateCommit commit;
         commit.target = &mActive->GetRef();
@@ -138,11 +140,11 @@ bool Recorder::UpdateMipmaps(TextureRef const& texture) {
 }
 
 void Recorder::AfterDraw() {
-    if (mFlushesAtOnce || list.IsFull()) Flush();
+    if (FlushesAtOnce() || list.IsFull()) Flush();
 }
 
 void Recorder::AddStencilClear(DepthStencilClear const& clear) {
-    if (mFlushesAtOnce) {
+    if (FlushesAtOnce()) {
         mStencils.Forget(clear.target.depthStencil);
     } else if (mStencils.TakeClear(clear)) {
         return;
@@ -160,7 +162,7 @@ void Recorder::Flush() {
     mHolders.clear();
     list.Clear(isFull);
     counters.listBytes.Set(list.GetCapacityBytes());
-    if (mHasDropped && IsIdle()) DeleteDropped();
+    if (Has(kHasDropped) && IsIdle()) DeleteDropped();
 }
 
 void Recorder::FlushIfUsed(DeviceName texture) {
@@ -175,7 +177,7 @@ void Recorder::Activate(RenderTarget& target) {
     // External code may read the other target once this one is bound, so the draws into it are flushed first.
     if (MOKA_UNLIKELY(!mIsDeferred) && mActive != &target) Flush();
     mActive = &target;
-    if (MOKA_UNLIKELY(mFlushesAtOnce)) End();
+    if (MOKA_UNLIKELY(FlushesAtOnce())) End();
 }
 
 void Recorder::Deactivate(RenderTarget const& target) {
@@ -257,20 +259,27 @@ void Recorder::SetDeferred(bool on) {
     mDevice->RestoreHost(HostState::All);
 }
 
+void Recorder::SetFlushesAtOnce() {
+    if (mIsExternal || !mIsDeferred)
+        mUnusual |= kFlushesAtOnce;
+    else
+        mUnusual &= ~kFlushesAtOnce;
+}
+
 void Recorder::Drop(DroppedKind kind, DeviceName name) {
-    if (!mAttached || name == 0) return;
+    if (!IsAttached() || name == 0) return;
     if (MayDeleteNow()) {
         Delete({kind, name});
         return;
     }
     std::lock_guard const lock(mDroppedLock);
-    if (!mAttached) return;
+    if (!IsAttached()) return;
     mDropped.push_back({kind, name});
-    mHasDropped = true;
+    mUnusual |= kHasDropped;
 }
 
 void Recorder::DropProgram(ProgramState const& program, DeviceName name) {
-    if (mAttached && IsRenderThread()) {
+    if (IsAttached() && IsRenderThread()) {
         if (requested->GetProgram().get() == &program) requested->SetProgram(nullptr);
         if (mStencils.Uses(name)) TryToCompleteStencils();
     }
@@ -288,11 +297,11 @@ void Recorder::TryToCompleteStencils() noexcept {
 
 void Recorder::DropTextureObject() {
     bool const isLast = --counters.textureObjects == 0;
-    if (!isLast || !mAttached) return;
+    if (!isLast || !IsAttached()) return;
     if (MayDeleteNow()) {
         mDevice->DeleteSamplers();
     } else {
-        mHasDropped = true;
+        mUnusual |= kHasDropped;
     }
 }
 
@@ -321,7 +330,7 @@ void Recorder::DeleteDropped() {
     {
         std::lock_guard const lock(mDroppedLock);
         dropped.swap(mDropped);
-        mHasDropped = false;
+        mUnusual &= ~kHasDropped;
     }
     for (Dropped const& one : dropped) Delete(one);
     if (counters.textureObjects == 0) mDevice->DeleteSamplers();

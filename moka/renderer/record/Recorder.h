@@ -50,20 +50,20 @@ public:
     void Detach();
 
     // Callable on any thread.
-    bool IsAttached() const { return mAttached; }
+    bool IsAttached() const { return !Has(kDetached); }
     bool IsRenderThread() const { return std::this_thread::get_id() == mRenderThread; }
 
     // Call this at the beginning of each request. Returns false if the context is detached.
     bool Begin() {
-        if (MOKA_UNLIKELY(!mAttached)) return false;
+        if (MOKA_UNLIKELY(mUnusual.load(std::memory_order_relaxed) != 0)) return Prepare();
         MOKA_CHECK(IsRenderThread(), "the renderer is used on the thread that attached it");
-        // In deferred mode GL cannot have changed since the last request, so there is nothing to prepare.
-        if (MOKA_UNLIKELY(mFlushesAtOnce || mHasDropped)) Prepare();
         return true;
     }
     // Call this at the end of a request that may have bound a frame buffer. Binds the one that the caller
     // expects.
-    void End();
+    void End() {
+        if (IsThrough()) BindExpected();
+    }
 
     // The following functions may be called between Begin and End only.
     Device& GetDevice() { return *mDevice; }
@@ -74,7 +74,7 @@ public:
     template <class Other>
     void Add(Other const& command) {
         list.Add(command);
-        if (mFlushesAtOnce || list.IsFull()) Flush();
+        if (FlushesAtOnce() || list.IsFull()) Flush();
     }
     void AddStencilClear(DepthStencilClear const& clear);
     // Call these around draws that are added to the list directly, as Fill does.
@@ -85,7 +85,7 @@ public:
     // Call this before a draw samples the texture. Returns true if it added a command that generates the
     // mipmap levels.
     bool UpdateMipmaps(TextureRef const& texture);
-    bool FlushesAtOnce() const { return mFlushesAtOnce; }
+    bool FlushesAtOnce() const { return Has(kFlushesAtOnce); }
     // Call this when the contents of the buffer are lost.
     void ForgetStencil(DeviceName depthStencil) { mStencils.Forget(depthStencil); }
     void Flush();
@@ -97,7 +97,7 @@ public:
     void CommitAtOnce(Commit commit) {
         if (IsThrough()) CommitNow(commit);
     }
-    bool IsThrough() const { return MOKA_UNLIKELY(mFlushesAtOnce) && list.IsEmpty(); }
+    bool IsThrough() const { return MOKA_UNLIKELY(FlushesAtOnce()) && list.IsEmpty(); }
 
     void Activate(RenderTarget& target);
     void Deactivate(RenderTarget const& target);
@@ -143,11 +143,13 @@ private:
         commit(state);
         mDevice->Commit(state);
     }
-    void SetFlushesAtOnce() { mFlushesAtOnce = mIsExternal || !mIsDeferred; }
+    bool Has(unsigned unusual) const { return (mUnusual.load(std::memory_order_relaxed) & unusual) != 0; }
+    void SetFlushesAtOnce();
     // True if no recorded or pending command refers to a name.
     bool IsIdle() const { return list.IsEmpty() && !mStencils.IsPending(); }
-    bool MayDeleteNow() const { return mAttached && IsRenderThread() && IsIdle(); }
-    [[gnu::cold]] void Prepare();
+    bool MayDeleteNow() const { return IsAttached() && IsRenderThread() && IsIdle(); }
+    [[gnu::cold]] bool Prepare();
+    [[gnu::cold]] void BindExpected();
     void Delete(Dropped const& dropped);
     void DeleteDropped();
     bool TakeForStencil(RunState const& state, GraphicsObject& object, int first, int count);
@@ -163,15 +165,18 @@ private:
     std::thread::id const mRenderThread = std::this_thread::get_id();
     RenderTarget* mActive = nullptr;
     bool mIsDeferred = false;
-    bool mIsExternal = false;   // from a commit to the invalidation: external code may call GL
-    bool mFlushesAtOnce = true; // immediate mode, or mIsExternal
+    bool mIsExternal = false; // from a commit to the invalidation: external code may call GL
     std::vector<GraphicsObject*> mHolders;
     StencilPreparations mStencils{list};
     // A draw that samples its own target samples this copy instead. It is kept while its size fits.
     std::shared_ptr<TextureStorage> mTargetCopy;
 
-    std::atomic<bool> mAttached{true};
-    std::atomic<bool> mHasDropped{false};
+    // What a request must look at before it begins. One number, because each request tests it: 0 while the
+    // context is attached, in deferred mode, with nothing to delete.
+    static constexpr unsigned kDetached = 1;
+    static constexpr unsigned kFlushesAtOnce = 2; // immediate mode, or mIsExternal
+    static constexpr unsigned kHasDropped = 4;
+    std::atomic<unsigned> mUnusual{kFlushesAtOnce};
     std::mutex mDroppedLock;
     std::vector<Dropped> mDropped;
 };
