@@ -1,23 +1,10 @@
 #include "apps/notebook/Frames.h"
 
+#include "apps/notebook/AllocationCount.h"
 #include "moka/graphics/task/WorkerTask.h"
 
 #include <algorithm>
 #include <cstdio>
-#include <cstdlib>
-#include <new>
-
-static thread_local std::uint64_t tAllocations = 0;
-
-// Replaces operator new for all C++ code of the process: the library, the application and the driver.
-MOKA_API void* operator new(std::size_t size) {
-    ++tAllocations;
-    if (void* const memory = std::malloc(size > 0 ? size : 1)) return memory;
-    throw std::bad_alloc();
-}
-
-MOKA_API void operator delete(void* memory) noexcept { std::free(memory); }
-MOKA_API void operator delete(void* memory, std::size_t) noexcept { std::free(memory); }
 
 namespace Moka::Notebook {
 namespace {
@@ -55,7 +42,7 @@ void Frames::Finish(std::int64_t begin, std::int64_t input) {
     std::int64_t const now = Trace::GetTime();
     Trace::NameTask("frame shown");
     if (input != 0) Trace::Add("notebook", "input to swap", input, now, nullptr, 0);
-    if (mShown.size() < mShown.capacity()) mShown.push_back({begin, input, now, tAllocations});
+    if (mShown.size() < mShown.capacity()) mShown.push_back({begin, input, now, CountAllocations()});
     mLast = ToMilliseconds(now - begin);
     mIsInFlight = false;
     mNotify();

@@ -1,6 +1,6 @@
 #include "bench/canvas/Frame.h"
 
-#include "bench/canvas/AllocationCount.h"
+#include "apps/notebook/AllocationCount.h"
 #include "moka/graphics/task/WorkerTask.h"
 #include "moka/host/RenderThread.h"
 #include "moka/renderer/RendererFactory.h"

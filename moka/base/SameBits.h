@@ -10,7 +10,7 @@ namespace Moka::detail {
 
 /// 8 bytes of an object of any type, at any alignment.
 struct __attribute__((packed, may_alias)) AnyWord {
-    std::uint64_t bits;
+    std::uint64_t bits; ///< the 8 bytes
 };
 
 /// Returns true if the words of a and b are equal. It is one expression because compilers

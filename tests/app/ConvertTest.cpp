@@ -6,23 +6,18 @@ namespace {
 using ::testing::AllOf;
 using ::testing::HasSubstr;
 
-class ConvertTest : public ToolTest {
-protected:
-    // What the tool writes is what saving the decoded input writes, so the way through the GPU changed
-    // nothing, and the encoder got the quality it should.
-    void ExpectEncodes(std::string const& input, std::string const& output, int quality) const {
-        Save(Load(input), "expected-" + output, quality);
-        EXPECT_TRUE(ReadFile(output) == ReadFile("expected-" + output)) << input << " to " << output;
-    }
-};
+using ConvertTest = ToolTest;
 
+// What the tool writes is what saving the decoded input writes, so the way through the GPU changed nothing, and the
+// encoder got the quality it should.
 TEST_F(ConvertTest, EveryFormatBecomesEveryFormat) {
     for (std::string const from : {"png", "jpg", "webp", "mki"}) {
         Save(MakeAlphaPattern(61, 47), "in." + from, 90);
         for (std::string const to : {"png", "jpg", "webp", "mki"}) {
             std::string const output = from + "-to." + to;
             RunWell("convert in." + from + " " + output);
-            ExpectEncodes("in." + from, output, to == "jpg" ? 90 : 100);
+            Save(Load("in." + from), "expected-" + output, to == "jpg" ? 90 : 100);
+            EXPECT_TRUE(ReadFile(output) == ReadFile("expected-" + output)) << output;
             if (to != "jpg") ExpectSamePixels(Load("in." + from), output);
         }
     }
@@ -31,18 +26,15 @@ TEST_F(ConvertTest, EveryFormatBecomesEveryFormat) {
 TEST_F(ConvertTest, ADashIsStandardInputAndOutput) {
     Picture const image = MakeAlphaPattern(61, 47);
     Save(image, "in.webp");
-    ProcessOptions options;
-    options.in = Path("in.webp");
-    WriteFile("out.png", RunWell("convert - -", options));
+    WriteFile("out.png", RunWell("convert - - < in.webp"));
     EXPECT_EQ(ReadFile("out.png").substr(1, 3), "PNG");
     ExpectSamePixels(image, "out.png");
-    EXPECT_EQ(RunWell("convert - - --to mki", options).substr(0, 4), "MKI1");
-    EXPECT_THAT(RunWell("convert - out.mki", options), HasSubstr("standard input (WebP 61x47) -> "));
+    EXPECT_EQ(RunWell("convert - - --to mki < in.webp").substr(0, 4), "MKI1");
+    EXPECT_THAT(RunWell("convert - out.mki < in.webp"), HasSubstr("standard input (WebP 61x47) -> "));
     ExpectSamePixels(image, "out.mki");
-    EXPECT_THAT(RunWell("info -", options), HasSubstr("standard input: WebP, 61x47, alpha, "));
+    EXPECT_THAT(RunWell("info - < in.webp"), HasSubstr("standard input: WebP, 61x47, alpha, "));
     WriteFile("scene.json", R"({"size": [7, 5], "background": "#102030", "operations": []})");
-    options.in = Path("scene.json");
-    WriteFile("drawn.webp", RunWell("draw - -o - --to webp", options));
+    WriteFile("drawn.webp", RunWell("draw - -o - --to webp < scene.json"));
     EXPECT_EQ(Load("drawn.webp").width, 7);
 }
 

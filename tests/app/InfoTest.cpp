@@ -14,15 +14,16 @@ TEST_F(InfoTest, TellsWhatEachFileIsWithoutADriverAndABrokenOneHidesNoOther) {
     Save(MakeAlphaPattern(32, 20), "e.webp");
     Save(MakeGradient(33, 20), "f.mki");
     WriteFile("bad.png", "nothing like it");
-    auto const size = [this](char const* name) { return std::to_string(ReadFile(name).size()); };
-    ProcessResult const result = Run(
-        {"info", "bad.png", "a.png", "b.png", "c d.jpg", "missing.png", "e.webp", "f.mki"}, WithoutDriver());
-    EXPECT_EQ(result.out, "a.png: PNG, 30x20, alpha, " + size("a.png") +
-                              " bytes, 2400 decoded, profile sRGB\n" + "b.png: PNG, 30x20, opaque, " +
-                              size("b.png") + " bytes, 2400 decoded, profile sRGB\n" +
-                              "c d.jpg: JPEG, 31x20, opaque, " + size("c d.jpg") + " bytes, 2480 decoded\n" +
-                              "e.webp: WebP, 32x20, alpha, " + size("e.webp") + " bytes, 2560 decoded\n" +
-                              "f.mki: mki, 33x20, alpha, " + size("f.mki") + " bytes, 2640 decoded\n");
+    ProcessResult const result =
+        Run("info bad.png a.png b.png 'c d.jpg' missing.png e.webp f.mki", kWithoutDriver);
+    auto const tell = [this](std::string const& name, char const* what, char const* more) {
+        return name + ": " + what + ", " + std::to_string(ReadFile(name).size()) + " bytes, " + more + "\n";
+    };
+    EXPECT_EQ(result.out, tell("a.png", "PNG, 30x20, alpha", "2400 decoded, profile sRGB") +
+                              tell("b.png", "PNG, 30x20, opaque", "2400 decoded, profile sRGB") +
+                              tell("c d.jpg", "JPEG, 31x20, opaque", "2480 decoded") +
+                              tell("e.webp", "WebP, 32x20, alpha", "2560 decoded") +
+                              tell("f.mki", "mki, 33x20, alpha", "2640 decoded"));
     EXPECT_EQ(result.status, kFailed);
     EXPECT_THAT(result.err, MatchesRegex("moka: [^\n]*bad\\.png[^\n]*\nmoka: [^\n]*missing\\.png[^\n]*\n"));
 }
@@ -35,7 +36,7 @@ TEST_F(InfoTest, TellsFramesAndShowsNoControlCharacter) {
     std::string const name = "a\x1B[2J\xC2\x9B\xFF.png";
     WriteFile(name, ReadFile("a.png").insert(33, control + checksum));
     EXPECT_THAT(
-        Run({"info", name}).out,
+        Run("info '" + name + "'").out,
         MatchesRegex("a\\?\\[2J\\?\xEF\xBF\xBD\\.png: PNG, 30x20, opaque, [0-9]+ bytes, 2400 decoded, "
                      "profile sRGB, 2 frames \\(one is read\\)\n"));
 }

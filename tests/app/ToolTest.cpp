@@ -3,24 +3,11 @@
 #include "tests/support/ImageCompare.h"
 
 #include <algorithm>
-#include <iterator>
 #include <sstream>
 
 namespace Moka::Testing {
 
 namespace fs = std::filesystem;
-
-Arguments::Arguments(char const* line) {
-    std::istringstream words(line);
-    assign(std::istream_iterator<std::string>(words), {});
-    std::replace(begin(), end(), std::string("EMPTY"), std::string());
-}
-
-ProcessOptions WithoutDriver() {
-    ProcessOptions options;
-    options.environment = {"__EGL_VENDOR_LIBRARY_DIRS=/nonexistent"};
-    return options;
-}
 
 void ToolTest::Save(Picture const& image, std::string const& name, int quality) const {
     ASSERT_TRUE(SaveImage(image, Path(name), quality));
@@ -30,30 +17,30 @@ void ToolTest::Truncate(std::string const& name) const {
     fs::resize_file(Path(name), fs::file_size(Path(name)) / 2);
 }
 
-ProcessResult ToolTest::Run(Arguments const& arguments, ProcessOptions const& options) const {
-    return MokaProcess(mFolder.string(), arguments, options).Wait();
+MokaProcess ToolTest::Start(std::string const& arguments, std::string const& before) const {
+    return MokaProcess(mFolder.string(), before + " exec '" MOKA_EXECUTABLE "' " + arguments);
 }
 
-std::string ToolTest::RunWell(Arguments const& arguments, ProcessOptions const& options) const {
-    ProcessResult const result = Run(arguments, options);
+std::string ToolTest::RunWell(std::string const& arguments, std::string const& before) const {
+    ProcessResult const result = Run(arguments, before);
     EXPECT_EQ(result.status, 0);
     EXPECT_EQ(result.err, "");
     return result.out;
 }
 
-void ToolTest::ExpectFails(Arguments const& arguments, int status, std::string const& parts,
-                           ProcessOptions const& options) const {
+void ToolTest::ExpectFails(std::string const& arguments, int status, std::string const& parts,
+                           std::string const& before) const {
     // With the time of the last change, which shows what was replaced by the same.
     auto const look = [this] {
-        std::vector<std::pair<fs::path, fs::file_time_type>> files;
+        std::vector<std::pair<fs::path, fs::file_time_type>> found;
         for (auto const& entry : fs::recursive_directory_iterator(mFolder))
-            files.emplace_back(entry.path(), entry.last_write_time());
-        std::sort(files.begin(), files.end());
-        return files;
+            found.emplace_back(entry.path(), entry.last_write_time());
+        std::sort(found.begin(), found.end());
+        return found;
     };
-    auto const before = look();
-    ProcessResult const result = Run(arguments, options);
-    SCOPED_TRACE(::testing::PrintToString(arguments) + " said: " + result.err);
+    auto const files = look();
+    ProcessResult const result = Run(arguments, before);
+    SCOPED_TRACE(arguments + " said: " + result.err);
     EXPECT_EQ(result.status, status);
     EXPECT_EQ(std::count(result.err.begin(), result.err.end(), '\n'), 1);
     EXPECT_EQ(result.err.rfind("moka: ", 0), 0u);
@@ -61,7 +48,7 @@ void ToolTest::ExpectFails(Arguments const& arguments, int status, std::string c
     for (std::string part; std::getline(each, part, '|');)
         EXPECT_THAT(result.err, ::testing::HasSubstr(part));
     EXPECT_EQ(result.out, "");
-    EXPECT_TRUE(look() == before);
+    EXPECT_TRUE(look() == files);
 }
 
 void ToolTest::ExpectSamePixels(Picture const& image, std::string const& name) const {

@@ -15,15 +15,8 @@ namespace Moka::Testing {
 constexpr int kFailed = 1;
 constexpr int kUsage = 2;
 
-// Words of a command line, or one by one where they hold spaces. EMPTY stands for an empty one.
-struct Arguments : std::vector<std::string> {
-    using vector::vector;
-    Arguments(char const* line);
-    Arguments(std::string const& line) : Arguments(line.c_str()) {}
-};
-
-// The options of a process that finds no driver.
-ProcessOptions WithoutDriver();
+// Before the tool's name, for a process that finds no driver.
+constexpr char const* kWithoutDriver = "__EGL_VENDOR_LIBRARY_DIRS=/nonexistent";
 
 class ToolTest : public ::testing::Test {
 protected:
@@ -41,13 +34,18 @@ protected:
     // Sorted; everything, hidden files as well.
     std::vector<std::string> List(std::string const& folder = ".") const { return mTemporary.List(folder); }
 
-    ProcessResult Run(Arguments const& arguments, ProcessOptions const& options = {}) const;
+    // Starts the tool with these arguments, which the shell reads. `before` stands before the tool's name: variables,
+    // or commands that end with a semicolon.
+    MokaProcess Start(std::string const& arguments, std::string const& before = {}) const;
+    ProcessResult Run(std::string const& arguments, std::string const& before = {}) const {
+        return Start(arguments, before).Wait();
+    }
     // Fails the test unless the tool succeeds without a word on stderr.
-    std::string RunWell(Arguments const& arguments, ProcessOptions const& options = {}) const;
+    std::string RunWell(std::string const& arguments, std::string const& before = {}) const;
     // One line on stderr that holds every part (they are separated by bars), nothing on stdout, and the folder as it
     // was.
-    void ExpectFails(Arguments const& arguments, int status, std::string const& parts,
-                     ProcessOptions const& options = {}) const;
+    void ExpectFails(std::string const& arguments, int status, std::string const& parts,
+                     std::string const& before = {}) const;
     void ExpectSamePixels(Picture const& image, std::string const& name) const;
 
 private:

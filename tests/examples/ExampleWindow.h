@@ -7,19 +7,20 @@
 #include <cstdint>
 #include <string>
 
+struct _XDisplay;
+
 namespace Moka::Testing {
 
 class ExampleWindow {
 public:
-    // The largest window on the screen. Tests begin without any.
     ExampleWindow();
     ~ExampleWindow();
     ExampleWindow(ExampleWindow const&) = delete;
     ExampleWindow& operator=(ExampleWindow const&) = delete;
 
-    // False while there is none.
-    bool Find(int width, int height);
-    Picture Grab(int width, int height) const;
+    // The pixels of the window of this size; empty while none is visible. The functions below act on the window that
+    // was seen last.
+    Picture Grab(int width, int height);
     void Resize(int width, int height);
     // As a click on its frame's button does it.
     void Close();
@@ -27,7 +28,7 @@ public:
     void SetClipboard(std::string const& text);
 
 private:
-    void* const mDisplay;
+    _XDisplay* const mDisplay;
     std::uintptr_t mWindow = 0;
 };
 

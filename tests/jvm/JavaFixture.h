@@ -55,30 +55,6 @@ protected:
         return recycled;
     }
 
-    jobject MakeObject(char const* className) const {
-        mEnv->PushLocalFrame(4);
-        jclass const type = mEnv->FindClass(className);
-        jobject const made = mEnv->NewObject(type, mEnv->GetMethodID(type, "<init>", "()V"));
-        EXPECT_FALSE(mEnv->ExceptionCheck());
-        return mEnv->PopLocalFrame(made);
-    }
-
-    // However often the action is done, no local reference stays and no frame of them: the frame on top is the
-    // one from before, and goes with what only it holds. Single ones that gather the VM's checks report.
-    template <class Action>
-    void ExpectNoReferencesLeft(Action const& action) const {
-        ASSERT_EQ(mEnv->PushLocalFrame(4), JNI_OK);
-        jweak const ours = mEnv->NewWeakGlobalRef(MakeObject("java/lang/Object"));
-        for (int i = 0; i < 500; ++i) action();
-        mEnv->PopLocalFrame(nullptr);
-        jclass const type = mEnv->FindClass("java/lang/System");
-        mEnv->CallStaticVoidMethod(type, mEnv->GetStaticMethodID(type, "gc", "()V"));
-        EXPECT_FALSE(mEnv->ExceptionCheck());
-        mEnv->DeleteLocalRef(type);
-        EXPECT_TRUE(mEnv->IsSameObject(ours, nullptr));
-        mEnv->DeleteWeakGlobalRef(ours);
-    }
-
     JNIEnv* const mEnv = JavaMachine::GetMainEnv();
 };
 

@@ -2,6 +2,7 @@
 #include "moka/base/Bitmap.h"
 #include "moka/base/log/AndroidLog.h"
 #include "tests/jvm/JavaFixture.h"
+#include "tests/jvm/PatchedFunctions.h"
 #include "tests/support/Allocation.h"
 #include "tests/support/LogCapture.h"
 
@@ -95,7 +96,8 @@ TEST_F(JniBitmapTest, RefusesWhatIsNoBitmapOfItsKindOrSizeBeforeAllocatingAnythi
     for (auto const& [width, height, rowBytes, config, reason] : cases)
         ExpectRefusal({width, height, rowBytes, config, {}, nullptr}, reason);
     ExpectRefusal(jobject{}, "there is no Java bitmap");
-    ExpectRefusal(MakeObject("java/lang/Object"), "getConfig: java.lang.NoSuchMethodError");
+    ExpectRefusal(mEnv->AllocObject(mEnv->FindClass("java/lang/Object")),
+                  "getConfig: java.lang.NoSuchMethodError");
     ExpectRefusal(JavaPicture(), "out of memory");
 }
 
@@ -110,8 +112,10 @@ TEST_F(JniBitmapTest, ReportsWhatIsThrownAndLeavesNothingPending) {
         source.failing = mute.c_str();
         ExpectRefusal(source, method + ": an exception that cannot be described");
     }
-    ExpectRefusal(MakeObject("android/graphics/Bitmap$WithoutCopy"),
-                  "copyPixelsToBuffer: java.lang.NoSuchMethodError");
+    {
+        PatchedFunctions const missing(mEnv, "copyPixelsToBuffer");
+        ExpectRefusal(JavaPicture(), "copyPixelsToBuffer: java.lang.NoSuchMethodError");
+    }
     // A bitmap that has more than it said; what Java wrote before it noticed is dropped.
     ExpectRefusal({1, 1, 4, "ARGB_8888", {1, 2, 3, 4, 5}, nullptr}, "java.nio.BufferOverflowException");
     jobject const javaBitmap = MakeJavaBitmap();
@@ -125,17 +129,16 @@ TEST_F(JniBitmapTest, RefusesWhatItCannotFillAndLeavesIt) {
     unsigned char own[4] = {9, 9, 9, 9};
     Bitmap empty, full;
     ASSERT_TRUE(full.Construct(own, 1, 1, 4, Bitmap::kFormatRgba8888, false, false));
-    JNINativeInterface_ functions = {};
-    functions.ExceptionClear = [](JNIEnv*) {};
-    functions.PushLocalFrame = [](JNIEnv*, jint) -> jint { return JNI_ENOMEM; };
-    JNIEnv crowded = {};
-    crowded.functions = &functions;
     LogCapture log;
     EXPECT_FALSE(JNI_ConvertJavaToBitmap(mEnv, javaBitmap, nullptr, false));
     EXPECT_FALSE(JNI_ConvertJavaToBitmap(mEnv, javaBitmap, &full, false));
     EXPECT_EQ(full.GetBuffer(), own);
     EXPECT_FALSE(JNI_ConvertJavaToBitmap(nullptr, javaBitmap, &empty, false));
-    EXPECT_FALSE(JNI_ConvertJavaToBitmap(&crowded, javaBitmap, &empty, false));
+    {
+        PatchedFunctions crowded(mEnv);
+        crowded->PushLocalFrame = [](JNIEnv*, jint) -> jint { return JNI_ENOMEM; };
+        EXPECT_FALSE(JNI_ConvertJavaToBitmap(mEnv, javaBitmap, &empty, false));
+    }
     EXPECT_THAT(log.GetTexts(ANDROID_LOG_ERROR),
                 testing::ElementsAre(HasSubstr("there is no bitmap to fill"), HasSubstr("has pixels already"),
                                      HasSubstr("the thread has no JNIEnv"),

@@ -1,16 +1,15 @@
-// What Java hands to the natives that are registered, and what the loading says.
+// What the loading registers and says, and the native records behind Java's displays.
 #include "moka/base/log/AndroidLog.h"
 #include "moka/graphics/jni/Display.h"
 #include "moka/graphics/jni/OnLoad.h"
-#include "tests/jvm/JavaMachine.h"
+#include "tests/jvm/JavaFixture.h"
 #include "tests/jvm/PatchedFunctions.h"
+#include "tests/support/Allocation.h"
 #include "tests/support/LogCapture.h"
 
 #include <cstdint>
 #include <cstring>
 #include <gmock/gmock.h>
-#include <gtest/gtest.h>
-#include <memory>
 #include <string>
 #include <vector>
 
@@ -18,111 +17,89 @@ namespace Moka::Testing {
 namespace {
 
 using testing::ElementsAre;
+using Registration = JavaFixture;
 
-std::vector<JNINativeMethod> registered;
-jint registration;
+constexpr char const* kDisplay = "com/velmora/android/sdk/pen/view/MokaDisplay";
 
-// The VM's own classes come by as well: looking ours up may be the first use of them.
-jint JNICALL RegisterNatives(JNIEnv* env, jclass type, JNINativeMethod const* methods, jint count) {
-    if (std::strncmp(methods->name, "Native_", 7) != 0)
-        return PatchedFunctions::GetOriginal().RegisterNatives(env, type, methods, count);
-    registered.assign(methods, methods + count);
-    return registration;
-}
-
-// The display's natives, as they would be registered.
-std::vector<std::string> LoadDisplay(jint result) {
-    PatchedFunctions functions(JavaMachine::GetMainEnv());
-    functions->RegisterNatives = &RegisterNatives;
-    registration = result;
-    LogCapture log;
+TEST_F(Registration, AJavaDisplayHasANativeRecordOfItsValuesUntilItIsClosed) {
+    std::int64_t const before = Faults::CountLive(Faults::Kind::Objects);
+    LogCapture const quiet;
     Display_OnLoad(JavaMachine::GetVm());
-    for (LogLine const& line : log.GetLines()) {
-        EXPECT_EQ(line.tag, "DisplayGlue");
-        EXPECT_EQ(line.priority, ANDROID_LOG_INFO);
-    }
-    return log.GetTexts();
-}
-
-template <class Function>
-Function* GetNative(std::size_t index) {
-    return reinterpret_cast<Function*>(registered.at(index).fnPtr);
-}
-
-TEST(Registration, DisplayHasFiveNativesInOrder) {
-    EXPECT_THAT(LoadDisplay(0), ElementsAre("Display JNI_OnLoad enter!!", "Display JNI_OnLoad Success"));
-    std::vector<std::string> texts;
-    for (JNINativeMethod const& method : registered)
-        texts.push_back(std::string(method.name) + method.signature);
-    EXPECT_THAT(texts, ElementsAre("Native_init(IIFIIFFIFFIIIZJ)J", "Native_finalize(J)V", "Native_copy(JJ)V",
-                                   "Native_setDebugLevel(JI)V", "Native_updateScreenOrientation(JI)V"));
-    EXPECT_THAT(LoadDisplay(-1), ElementsAre("Display JNI_OnLoad enter!!", "RegisterNatives is failed"));
-}
-
-class CountedDisplay : public Display {
-public:
-    CountedDisplay()
-        : Display(1, 1, 1, 1, 1, 1, 1, 1, 1, 1, LayoutDirection{0}, Orientation{0}, ScreenOrientation{0},
-                  false, false, 0) {}
-    ~CountedDisplay() override { ++destroyed; }
-
-    static inline int destroyed = 0;
-};
-
-TEST(Registration, DisplayNativesMakeChangeCopyAndDestroyDisplays) {
-    LoadDisplay(0);
-    auto const init = GetNative<jlong(JNIEnv*, jclass, jint, jint, jfloat, jint, jint, jfloat, jfloat, jint,
-                                      jfloat, jfloat, jint, jint, jint, jboolean, jlong)>(0);
-    jlong const handle = init(nullptr, nullptr, 1, -2, 3.5f, 4, 5, 6.25f, 7.125f, 8, 9.5f, -10.5f, 11, 12, 13,
-                              JNI_TRUE, 0x1234567890abL);
-    GetNative<void(JNIEnv*, jclass, jlong, jint)>(3)(nullptr, nullptr, handle, -3);
-    GetNative<void(JNIEnv*, jclass, jlong, jint)>(4)(nullptr, nullptr, handle, 99);
-    auto* const copy = new CountedDisplay;
-    auto const copied = static_cast<jlong>(reinterpret_cast<std::intptr_t>(copy));
-    GetNative<void(JNIEnv*, jclass, jlong, jlong)>(2)(nullptr, nullptr, copied, handle);
-    auto const finalize = GetNative<void(JNIEnv*, jclass, jlong)>(1);
-    finalize(nullptr, nullptr, handle);
-    EXPECT_THAT((std::vector<double>{double(copy->GetWidthPixels()), double(copy->GetHeightPixels()),
-                                     copy->GetSystemDensity(), double(copy->GetLocalWidthPixels()),
-                                     double(copy->GetLocalHeightPixels()), copy->GetDensity(),
-                                     copy->GetScaledDensity(), copy->GetXdpi(), copy->GetYdpi()}),
+    jclass const type = mEnv->FindClass(kDisplay);
+    auto const find = [&](char const* name, std::string const& signature) {
+        EXPECT_FALSE(mEnv->ExceptionCheck()) << "before " << name;
+        return mEnv->GetMethodID(type, name, signature.c_str());
+    };
+    auto const make = [&](auto... values) {
+        return mEnv->NewObject(type, find("<init>", "(IIFIIFFIFFIIIZJ)V"), values...);
+    };
+    auto const call = [&](jobject display, char const* name, std::string const& parameters, auto... values) {
+        mEnv->CallVoidMethod(display, find(name, "(" + parameters + ")V"), values...);
+    };
+    auto const get = [&](jobject display) {
+        jlong const handle = mEnv->CallLongMethod(display, find("getHandle", "()J"));
+        return reinterpret_cast<Display const*>(static_cast<std::intptr_t>(handle));
+    };
+    jobject const source =
+        make(1, -2, 3.5, 4, 5, 6.25, 7.125, 8, 9.5, -10.5, 11, 12, 13, JNI_TRUE, jlong{0x1234567890ab});
+    jobject const copy = make(0, 0, 0.0, 0, 0, 0.0, 0.0, 0, 0.0, 0.0, 0, 0, 0, JNI_FALSE, jlong{0});
+    call(source, "setDebugLevel", "I", -3);
+    call(source, "updateScreenOrientation", "I", 99);
+    call(copy, "copy", "L" + std::string(kDisplay) + ";", source);
+    EXPECT_EQ(get(source)->GetDensityDpi(), 8);
+    EXPECT_TRUE(get(source)->IsTablet());
+    EXPECT_FALSE(get(source)->IsUWP());
+    Display const& copied = *get(copy);
+    EXPECT_THAT((std::vector<double>{double(copied.GetWidthPixels()), double(copied.GetHeightPixels()),
+                                     copied.GetSystemDensity(), double(copied.GetLocalWidthPixels()),
+                                     double(copied.GetLocalHeightPixels()), copied.GetDensity(),
+                                     copied.GetScaledDensity(), copied.GetXdpi(), copied.GetYdpi()}),
                 ElementsAre(1, -2, 3.5, 4, 5, 6.25, 7.125, 9.5, -10.5));
-    EXPECT_EQ(copy->GetLayoutDirection(), Display::LayoutDirection{11});
-    EXPECT_EQ(copy->GetOrientation(), Display::Orientation{12});
-    EXPECT_EQ(copy->GetScreenOrientation(), Display::ScreenOrientation{99});
-    EXPECT_EQ(copy->GetAppVsyncOffsetNanos(), 0x1234567890abL);
-    EXPECT_EQ(copy->GetDebugLevel(), -3);
-    finalize(nullptr, nullptr, copied);
-    finalize(nullptr, nullptr, 0);
-    EXPECT_EQ(CountedDisplay::destroyed, 1);
+    EXPECT_EQ(copied.GetLayoutDirection(), Display::LayoutDirection{11});
+    EXPECT_EQ(copied.GetOrientation(), Display::Orientation{12});
+    EXPECT_EQ(copied.GetScreenOrientation(), Display::ScreenOrientation{99});
+    EXPECT_EQ(copied.GetAppVsyncOffsetNanos(), 0x1234567890abL);
+    EXPECT_EQ(copied.GetDebugLevel(), -3);
+    for (jobject const display : {source, copy, copy}) call(display, "close", "");
+    EXPECT_EQ(Faults::CountLive(Faults::Kind::Objects), before);
 }
 
-// What is looked up next is looked up under the first one's exception, which nobody is to clear.
-TEST(Registration, AClassThatIsMissingIsTheExceptionOfTheLoading) {
-    JNIEnv* const env = JavaMachine::GetMainEnv();
+// What is looked up next is looked up under the first one's exception, which nobody is to clear; the VM's checks say so.
+TEST_F(Registration, AClassThatIsMissingIsTheExceptionOfTheLoading) {
     struct {
         char const* name;
         char const* line;
+        int priority;
     } const cases[] = {
-        {"com/velmora/android/sdk/pen/graphics/MokaBitmapLoader", "Cannot find BitmapLoader Class"},
-        {"com/velmora/android/sdk/pen/view/MokaDisplay", "Cannot find Display Class"},
-        {"no class", "RegisterNatives is failed"},
+        {"com/velmora/android/sdk/pen/graphics/MokaBitmapLoader", "Cannot find BitmapLoader Class",
+         ANDROID_LOG_ERROR},
+        {kDisplay, "Cannot find Display Class", ANDROID_LOG_INFO},
+        {"no class", "RegisterNatives is failed", ANDROID_LOG_INFO},
+        {"no class", "RegisterNatives is failed", ANDROID_LOG_ERROR},
     };
-    for (auto const& [name, line] : cases) {
+    for (auto const& [name, line, priority] : cases) {
         LogCapture const log;
         {
-            PatchedFunctions missing(env, name);
-            missing->RegisterNatives = &RegisterNatives;
-            registration = -1; // or the loader's thread would be started
+            PatchedFunctions missing(mEnv, name);
+            // Or the loader's thread would be started. The VM's own classes come by as well: looking ours up may
+            // be the first use of them.
+            missing->RegisterNatives = [](JNIEnv* env, jclass type, JNINativeMethod const* methods,
+                                          jint count) {
+                return std::strncmp(methods->name, "Native_", 7) == 0
+                           ? -1
+                           : PatchedFunctions::GetOriginal().RegisterNatives(env, type, methods, count);
+            };
             JNI_OnLoad(JavaMachine::GetVm(), nullptr);
         }
-        EXPECT_EQ(env->ExceptionCheck(), std::string(name) != "no class") << name;
-        env->ExceptionClear();
-        EXPECT_GE(log.Count(ANDROID_LOG_INFO, line) + log.Count(ANDROID_LOG_ERROR, line), 1) << name;
+        EXPECT_EQ(mEnv->ExceptionCheck(), std::string(name) != "no class") << name;
+        mEnv->ExceptionClear();
+        EXPECT_EQ(log.Count(priority, line), 1) << name;
+        EXPECT_EQ(log.Count(ANDROID_LOG_INFO, "Success"), 1) << "of the whole";
     }
+    EXPECT_THAT(JavaMachine::TakeOutput(), testing::HasSubstr("exception pending"));
 }
 
-TEST(Registration, AVmThatIsTooOldIsRefused) {
+TEST_F(Registration, AVmThatIsTooOldIsRefused) {
     JNIInvokeInterface_ functions = {};
     JavaVM vm = {};
     vm.functions = &functions;
@@ -139,6 +116,7 @@ TEST(Registration, AVmThatIsTooOldIsRefused) {
     log.Clear();
     Display_OnLoad(&vm);
     EXPECT_THAT(log.GetTexts(), ElementsAre("Display JNI_OnLoad enter!!", "Display : Cannot find env"));
+    EXPECT_EQ(log.Find("Display : Cannot find env").tag, "DisplayGlue");
     EXPECT_THAT(versions, ElementsAre(0x10004, 0x10002));
 }
 

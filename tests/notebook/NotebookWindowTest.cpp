@@ -13,7 +13,7 @@
 #include <filesystem>
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
-#include <regex>
+#include <sstream>
 #include <thread>
 
 namespace Moka::Testing {
@@ -32,78 +32,64 @@ constexpr int kControl = 64; // SDL's number
 constexpr int kShift = 1;
 constexpr int kImageSlack = 1; // the window samples a scaled image relative to a tile's corner
 
-// Waits up to some seconds, because sanitizers and a busy machine are slow.
-template <class Condition>
-bool Soon(Condition const& holds) {
-    for (int i = 0; i < 800; ++i) {
-        if (holds()) return true;
-        std::this_thread::sleep_for(std::chrono::milliseconds(50));
-    }
-    return false;
-}
-
 // Lines of a file for --replay.
 class Script {
 public:
-    void Add(std::string const& event) { mText += std::to_string(mTime) + ' ' + event + '\n'; }
+    template <class... Words>
+    void Add(Words const&... words) {
+        mText << mTime;
+        ((mText << ' ' << words), ...);
+        mText << '\n';
+    }
     // Draws with a finger whose pressure increases. The points are in window pixels.
     void Touch(std::vector<PointF> const& points) {
-        std::size_t i = 0;
+        char const* word = "finger-down";
+        float pressure = 0.2f;
         for (PointF const& p : points) {
-            std::string const word = i == 0 ? "finger-down" : "finger";
-            Add(word + " 7 " + std::to_string(p.x / kWidth) + ' ' + std::to_string(p.y / kHeight) + ' ' +
-                std::to_string(0.2f + 0.6f * static_cast<float>(i++) / static_cast<float>(points.size())));
+            Add(word, 7, p.x / kWidth, p.y / kHeight, pressure);
+            word = "finger";
+            pressure += 0.6f / static_cast<float>(points.size());
             mTime += 4;
         }
         Add("finger-up 7 0 0 0");
     }
     void Drag(PointF from, PointF to) {
-        auto const at = [](PointF p) {
-            return std::to_string(static_cast<int>(p.x)) + ' ' + std::to_string(static_cast<int>(p.y));
-        };
-        Add("press " + at(from) + " 1");
+        Add("press", from.x, from.y, 1);
         for (int i = 1; i <= 20; ++i) {
             float const t = static_cast<float>(i) / 20;
             mTime += 4;
-            Add("move " + at({from.x + (to.x - from.x) * t, from.y + (to.y - from.y) * t}) + " 1");
+            Add("move", std::lround(from.x + (to.x - from.x) * t), std::lround(from.y + (to.y - from.y) * t),
+                1);
         }
-        Add("release " + at(to) + " 1");
+        Add("release", to.x, to.y, 1);
     }
-    void Key(char key, int modifiers = 0) {
-        Add("key " + std::to_string(static_cast<int>(key)) + ' ' + std::to_string(modifiers));
-    }
+    void Key(int key, int modifiers = 0) { Add("key", key, modifiers); }
     // Presses a key and answers its prompt: replaces the end of the proposed text.
     void Ask(char key, int modifiers, std::size_t count, std::string const& end) {
         Key(key, modifiers);
         for (std::size_t i = 0; i < count; ++i) Key('\b');
-        if (!end.empty()) Add("text " + end);
+        Add("text", end);
         Key('\r');
         Add("idle");
     }
-    std::string const& GetText() const { return mText; }
+    std::string GetText() const { return mText.str(); }
 
 private:
     int mTime = 0;
-    std::string mText;
+    std::ostringstream mText;
 };
 
-// Writes "moka" with a finger, each letter in one or two strokes.
+// Writes seven loops with a finger, from left to right.
 void WriteWord(Script& script, float x, float y) {
-    auto const arc = [&](float cx, float from, float to, float rx, float ry) {
+    for (int letter = 0; letter < 7; ++letter) {
         std::vector<PointF> points;
         for (int i = 0; i <= 16; ++i) {
-            float const a = from + (to - from) * static_cast<float>(i) / 16;
-            points.emplace_back(x + cx + rx * std::cos(a), y - ry * std::sin(a));
+            float const angle = static_cast<float>(i) * 0.4f;
+            points.emplace_back(x + 20 - 20 * std::cos(angle), y - 50 * std::sin(angle));
         }
-        return points;
-    };
-    constexpr float kPi = 3.14159265f;
-    for (float const cx : {20.0f, 60.0f}) script.Touch(arc(cx, kPi, 0, 20, 50)); // m
-    script.Touch(arc(125, 0, 2 * kPi, 28, 26));                                  // o
-    script.Touch({{x + 175, y - 70}, {x + 176, y - 20}, {x + 175, y + 25}});     // k
-    script.Touch({{x + 215, y - 30}, {x + 178, y - 4}, {x + 218, y + 26}});
-    script.Touch(arc(262, 0, 2 * kPi, 28, 26)); // a
-    script.Touch({{x + 292, y - 28}, {x + 291, y}, {x + 300, y + 28}});
+        script.Touch(points);
+        x += 42;
+    }
 }
 
 class NotebookWindowTest : public ::testing::Test {
@@ -114,15 +100,17 @@ protected:
         EXPECT_TRUE(SaveImage(Scenes::MakePicture(2, 600, 400), mFolder.Path("photo.png")));
     }
 
-    std::unique_ptr<MokaProcess> Start(std::vector<std::string> arguments, ProcessOptions options = {}) {
-        arguments.insert(arguments.end(),
-                         {"--width", std::to_string(kWidth), "--height", std::to_string(kHeight)});
-        return std::make_unique<MokaProcess>(mFolder.GetPath().string(), std::move(arguments),
-                                             std::move(options));
+    // `before` stands before the program's name in the shell's command.
+    std::unique_ptr<MokaProcess> Start(std::string const& arguments, std::string const& before = {}) {
+        return std::make_unique<MokaProcess>(mFolder.GetPath().string(),
+                                             before + " exec '" MOKA_EXECUTABLE "' --width " +
+                                                 std::to_string(kWidth) + " --height " +
+                                                 std::to_string(kHeight) + " " + arguments);
     }
-    std::string WriteScript(Script const& script) {
+    std::unique_ptr<MokaProcess> Replay(Script const& script, std::string const& arguments,
+                                        std::string const& before = {}) {
         WriteFile(mFolder.Path("input.txt"), script.GetText());
-        return "input.txt";
+        return Start("--replay input.txt " + arguments, before);
     }
     // Runs xdotool on the window.
     static void Do(std::string const& what) {
@@ -134,8 +122,8 @@ protected:
     Picture Grab() {
         Picture seen;
         EXPECT_TRUE(Soon([&] {
-            if (!mWindow.Find(kWidth, kHeight)) return false;
             Picture const next = mWindow.Grab(kWidth, kHeight);
+            if (next.width == 0) return false;
             bool const isStill = seen == next && next.GetColor(5, 5) != Color{0, 0, 0, 255};
             seen = next;
             if (!isStill) std::this_thread::sleep_for(std::chrono::milliseconds(400));
@@ -143,9 +131,7 @@ protected:
         }));
         return seen;
     }
-    static Picture GetPagePart(Picture const& window, int rows = kView) {
-        return window.Crop(kEdge, kToolbar, kPage, rows);
-    }
+    static Picture GetPagePart(Picture const& window) { return window.Crop(kEdge, kToolbar, kPage, kView); }
     // Draws the page's file with `moka draw`.
     Picture Draw(std::string const& page) {
         std::string const out = mFolder.Path("drawn.png");
@@ -192,9 +178,8 @@ TEST_F(NotebookWindowTest, ShowsThePixelsOfItsFileAndOpensItAgain) {
     script.Add("finger-up 2 0 0 0");
     script.Add("idle");
     script.Key('0');
-    script.Add("key 1073741898 0"); // Home
-    auto process = Start({"page.json", "--replay", WriteScript(script)});
-    Soon([&] { return std::filesystem::exists(mFolder.Path("page.json.journal")) || !mWindow.Find(1, 1); });
+    script.Key(1073741898); // Home
+    auto process = Replay(script, "page.json");
     Picture const top = Grab();
     Do("key ctrl+s");
     ASSERT_TRUE(Soon([&] { return std::filesystem::exists(mFolder.Path("page.json")); }));
@@ -220,7 +205,7 @@ TEST_F(NotebookWindowTest, ShowsThePixelsOfItsFileAndOpensItAgain) {
     ExpectSame(GetPagePart(top), GetPagePart(Grab()), "zoomed back");
     Close(*process);
 
-    process = Start({}); // the last page
+    process = Start(""); // the last page
     ExpectSame(GetPagePart(top), GetPagePart(Grab()), "opened again");
     process->Signal(SIGTERM);
     EXPECT_EQ(process->Wait().status, 0);
@@ -229,12 +214,12 @@ TEST_F(NotebookWindowTest, ShowsThePixelsOfItsFileAndOpensItAgain) {
 TEST_F(NotebookWindowTest, AKillLosesNothingThatWasAutosaved) {
     Script script;
     WriteWord(script, 200, 250);
-    auto process = Start({"page.json", "--autosave", "0.1", "--replay", WriteScript(script)});
+    auto process = Replay(script, "page.json --autosave 0.1");
     Picture const before = Grab();
     process->Signal(SIGKILL);
     EXPECT_EQ(process->Wait().signal, SIGKILL);
     EXPECT_FALSE(std::filesystem::exists(mFolder.Path("page.json")));
-    process = Start({"page.json"});
+    process = Start("page.json");
     ExpectSame(GetPagePart(before), GetPagePart(Grab()), "after a kill");
     Close(*process);
     EXPECT_EQ(mFolder.List(), (std::vector<std::string>{"input.txt", "page.json", "photo.png", "state"}));
@@ -242,7 +227,7 @@ TEST_F(NotebookWindowTest, AKillLosesNothingThatWasAutosaved) {
 
 TEST_F(NotebookWindowTest, ABrokenPageAndAFullDiskAreReportedAndKeepTheirFile) {
     WriteFile(mFolder.Path("page.json"), "{\"size\": [1200, 1600], \"operations\": [");
-    auto process = Start({"page.json"});
+    auto process = Start("page.json");
     Picture const told = Grab();
     EXPECT_NE(told.GetColor(5, kHeight - 5), told.GetColor(5, kHeight - 200)) << "a message at the bottom";
     Do("key ctrl+s key Escape");
@@ -253,9 +238,7 @@ TEST_F(NotebookWindowTest, ABrokenPageAndAFullDiskAreReportedAndKeepTheirFile) {
 
     Script script;
     WriteWord(script, 200, 250);
-    ProcessOptions full;
-    full.fileSizeLimit = 3000;
-    process = Start({"full.json", "--replay", WriteScript(script)}, full);
+    process = Replay(script, "full.json", "ulimit -f 6;"); // 3072 bytes
     Picture const written = Grab();
     mWindow.Close();
     EXPECT_TRUE(Soon([&] { return !(mWindow.Grab(kWidth, kHeight) == written); }))
@@ -293,7 +276,7 @@ TEST_F(NotebookWindowTest, ExportsPastesAndOpensByKeysAndPrompts) {
     script.Drag({400, 400}, {500, 400});
     script.Key('s', kControl);
     script.Add("quit"); // while it saves
-    ProcessResult const result = Start({"page.json", "--replay", WriteScript(script)})->Wait();
+    ProcessResult const result = Replay(script, "page.json")->Wait();
     EXPECT_EQ(result.status, 0);
     for (char const* const told :
          {"cannot put ", "broken.png on the page", "cannot read the image", "no side above 16383",
@@ -309,27 +292,25 @@ TEST_F(NotebookWindowTest, TheRenderThreadDoesNotAllocateForInkAfterTheFirstFram
     Script script;
     for (float y = 200; y < 700; y += 100) WriteWord(script, 200, y);
     script.Add("quit");
-    ProcessResult const result =
-        Start({"page.json", "--statistics", "--replay", WriteScript(script)})->Wait();
-    std::smatch count;
-    ASSERT_TRUE(std::regex_search(result.out, count, std::regex("(\\d+) in the last")));
-    EXPECT_LT(std::stoi(count[1]), 100) << "more allocations than the growth of some vectors";
+    ProcessResult const result = Replay(script, "page.json --statistics")->Wait();
+    std::size_t const end = result.out.find(" in the last");
+    ASSERT_NE(end, std::string::npos);
+    EXPECT_LT(std::stoi(result.out.substr(result.out.rfind(' ', end - 1))), 100)
+        << "more allocations than the growth of some vectors";
 }
 
 TEST_F(NotebookWindowTest, ReportsStartFailuresWithARemedy) {
-    struct Case {
-        std::vector<std::string> arguments;
-        std::string environment;
+    struct {
+        char const* arguments;
+        char const* environment;
         char const* message;
         int status;
-    };
-    for (Case const& c : {Case{{}, "DISPLAY=:none", "is DISPLAY set?", 1},
-                          Case{{}, "__EGL_VENDOR_LIBRARY_DIRS=/nonexistent", "RenderThread: ", 1},
-                          Case{{"--replay", "none.txt"}, "A=b", "cannot read none.txt", 1},
-                          Case{{"--autosave", "x"}, "A=b", "--help", 2}}) {
-        ProcessOptions options;
-        options.environment = {c.environment};
-        ProcessResult const result = Start(c.arguments, options)->Wait();
+    } const cases[] = {{"", "DISPLAY=:none", "is DISPLAY set?", 1},
+                       {"", "__EGL_VENDOR_LIBRARY_DIRS=/nonexistent", "RenderThread: ", 1},
+                       {"--replay none.txt", "", "cannot read none.txt", 1},
+                       {"--autosave x", "", "--help", 2}};
+    for (auto const& c : cases) {
+        ProcessResult const result = Start(c.arguments, c.environment)->Wait();
         EXPECT_EQ(result.status, c.status) << c.message;
         EXPECT_THAT(result.err, HasSubstr(c.message));
     }

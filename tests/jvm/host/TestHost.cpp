@@ -25,17 +25,6 @@ String ToString(JNIEnv* env, jstring text) {
     return String(units.data(), static_cast<int>(units.size()));
 }
 
-// Width and height in the machine's order, then the pixels.
-jbyteArray ToArray(JNIEnv* env, std::unique_ptr<Bitmap> const& bitmap) {
-    if (!bitmap) return nullptr;
-    jint const size[] = {bitmap->GetWidth(), bitmap->GetHeight()};
-    jsize const bytes = size[0] * size[1] * 4;
-    jbyteArray const array = env->NewByteArray(bytes + jsize{sizeof size});
-    env->SetByteArrayRegion(array, 0, sizeof size, reinterpret_cast<jbyte const*>(size));
-    env->SetByteArrayRegion(array, sizeof size, bytes, reinterpret_cast<jbyte const*>(bitmap->GetBuffer()));
-    return array;
-}
-
 } // namespace
 
 extern "C" {
@@ -59,14 +48,19 @@ JNIEXPORT jint JNICALL Java_moka_Host_loadBridge(JNIEnv* env, jclass) {
     return MKBitmapFactory_OnLoad(javaVm, env);
 }
 
-JNIEXPORT jbyteArray JNICALL Java_moka_Host_decodeThroughJava(JNIEnv* env, jclass, jstring path, jint width,
-                                                              jint height) {
+JNIEXPORT jlong JNICALL Java_moka_Host_decodeThroughJava(JNIEnv* env, jclass, jstring path, jint width,
+                                                         jint height) {
     String const file = ToString(env, path);
-    return ToArray(env, std::unique_ptr<Bitmap>(CreateBitmapJNI(&file, width, height)));
+    std::unique_ptr<Bitmap> const bitmap(CreateBitmapJNI(&file, width, height));
+    return bitmap ? jlong{bitmap->GetWidth()} << 32 | bitmap->GetHeight() : 0;
 }
 
-JNIEXPORT jbyteArray JNICALL Java_moka_Host_decodeNatively(JNIEnv* env, jclass, jstring path) {
+JNIEXPORT jboolean JNICALL Java_moka_Host_isDecodedAlike(JNIEnv* env, jclass, jstring path) {
     String const file = ToString(env, path);
-    return ToArray(env, std::unique_ptr<Bitmap>(BitmapFactory::CreateBitmapForGraphics(&file)));
+    std::unique_ptr<Bitmap> const a(CreateBitmapJNI(&file, 0, 0));
+    std::unique_ptr<Bitmap> const b(BitmapFactory::CreateBitmapForGraphics(&file));
+    if (!a || !b || a->GetWidth() != b->GetWidth() || a->GetHeight() != b->GetHeight()) return false;
+    auto const bytes = static_cast<std::size_t>(a->GetWidth()) * static_cast<std::size_t>(a->GetHeight()) * 4;
+    return std::memcmp(a->GetBuffer(), b->GetBuffer(), bytes) == 0;
 }
 }

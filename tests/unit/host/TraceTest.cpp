@@ -1,15 +1,13 @@
-// Traces: a file that other programs' parsers read, with everything that happened and nothing twice.
+// Traces: a file that other programs' parsers read, with everything that happened and nothing twice. Traced is the library
+// over the device without a driver, as an application's own tests can use it.
 #include "moka/base/Trace.h"
 
-#include "moka/base/Bitmap.h"
-#include "moka/base/BitmapFactory.h"
-#include "moka/base/RefPtr.h"
-#include "moka/base/String.h"
 #include "moka/base/log/AndroidLog.h"
 #include "moka/graphics/MokaGraphics.h"
 #include "moka/graphics/task/WorkerTask.h"
 #include "moka/host/RenderThread.h"
 #include "tests/support/LogCapture.h"
+#include "tests/support/TestFiles.h"
 
 #include <gmock/gmock.h>
 #include <nlohmann/json.hpp>
@@ -34,12 +32,6 @@ using testing::AllOf;
 using testing::Contains;
 using testing::HasSubstr;
 
-// Of this process, so that tests run side by side.
-std::string MakePath(char const* name) {
-    auto const* const test = ::testing::UnitTest::GetInstance()->current_test_info();
-    return (std::filesystem::temp_directory_path() / (std::string("moka-") + test->name() + name)).string();
-}
-
 class Events {
 public:
     explicit Events(std::string const& path) {
@@ -49,7 +41,6 @@ public:
             if (event.at("ph") == "M" && event.at("name") == "thread_name")
                 threads.insert(event.at("args").at("name").get<std::string>());
         }
-        std::filesystem::remove(path);
     }
 
     std::vector<json> Find(char const* category, char const* name) const {
@@ -67,24 +58,18 @@ public:
         return sum;
     }
 
-    // In each thread, those of a category are in the order of their ends, and one that begins within another ends
-    // there. Nanoseconds.
-    void ExpectOrder() const {
-        std::map<std::pair<int, std::string>, long> last;
-        std::map<int, std::vector<std::pair<long, long>>> rows;
+    // In each thread, an event that begins within another ends there.
+    void ExpectNested() const {
+        // Nanoseconds, the end negative: of two that begin together the longer one is first.
+        std::map<int, std::multiset<std::pair<long, long>>> rows;
         for (json const& event : mEvents) {
-            int const id = event.at("tid").get<int>();
             long const begin = std::lround(event.at("ts").get<double>() * 1000);
             long const end = begin + std::lround(event.at("dur").get<double>() * 1000);
-            long& before = last[{id, event.at("cat").get<std::string>()}];
-            EXPECT_GE(begin, 0);
-            EXPECT_GE(end, std::max(before, begin)) << event;
-            before = end;
-            rows[id].emplace_back(begin, -end);
+            EXPECT_TRUE(0 <= begin && begin <= end) << event;
+            rows[event.at("tid").get<int>()].emplace(begin, -end);
         }
         EXPECT_EQ(rows.size(), threads.size());
-        for (auto& [id, row] : rows) {
-            std::sort(row.begin(), row.end());
+        for (auto const& [id, row] : rows) {
             std::vector<long> ends;
             for (auto const& [begin, end] : row) {
                 while (!ends.empty() && ends.back() <= begin) ends.pop_back();
@@ -107,43 +92,42 @@ struct Sleeper {
     }
 };
 
-using BitmapPtr = RefPtr<IMKBitmap>;
-
 // Uploads 32 x 32, draws, reads back.
 void Work(RenderThread& queue, int rectangles) {
-    std::vector<std::uint32_t> pixels(32 * 32);
-    auto const bitmap =
-        BitmapPtr::Adopt(MKGraphicsFactory::CreateBitmap(&queue, 32, 32, pixels.data(), false, 1, false));
-    auto const canvas = RefPtr<IMKCanvas>::Adopt(MKGraphicsFactory::CreateCanvas(&queue, bitmap.Get(), 1));
+    Picture pixels(32, 32);
+    auto const bitmap = NewBitmap(queue, 32, 32, pixels.pixels.data());
+    auto const canvas = NewCanvas(queue, bitmap);
     for (int i = 0; i < rectangles; ++i) canvas->DrawRect(0, 0, 8, 8, nullptr);
     canvas->ClearAll(0, 0, 0, 1);
-    bitmap->GetBitmapData(bitmap->GetBitmapRect(), pixels.data());
+    bitmap->GetBitmapData(bitmap->GetBitmapRect(), pixels.pixels.data());
+    EXPECT_EQ(pixels.GetColor(31, 31), (Color{0, 0, 0, 255}));
 }
 
-void SaveAndLoad(std::string const& path) {
-    Bitmap image;
-    image.Construct(new unsigned char[6 * 5 * 4](), 6, 5, 6 * 4, Bitmap::kFormatRgba8888, false, true);
-    String const name = String::FromFileName(path);
-    EXPECT_TRUE(BitmapFactory::SaveBitmap(&image, &name, 100));
-    delete BitmapFactory::CreateBitmapForGraphics(&name);
-    std::filesystem::remove(path);
-}
+class TraceTest : public testing::Test {
+protected:
+    TempFolder const folder;
+    std::string const path = folder.Path("trace.json");
+};
 
-TEST(TraceTest, TellsOfEveryThreadTaskFlushTransferAndFileOnce) {
+TEST_F(TraceTest, TellsOfEveryThreadTaskFlushTransferAndFileOnce) {
     RenderThreadOptions options;
-    options.tracePath = MakePath(".json");
+    options.tracePath = path;
+    options.limits.maxTextureSize = 32;
     std::string error;
     RendererStatistics statistics;
     {
         auto const queue = RenderThread::Start(options, &error);
         ASSERT_TRUE(queue) << error;
+        EXPECT_EQ(queue->GetContextInfo().path, "no driver");
+        EXPECT_EQ(queue->GetContextInfo().maxTextureSize, 32);
         EXPECT_TRUE(Trace::IsOn());
-        EXPECT_FALSE(Trace::Start(options.tracePath + "2", &error));
-        EXPECT_THAT(error, AllOf(HasSubstr(options.tracePath), HasSubstr("stop it first")));
+        EXPECT_FALSE(Trace::Start(path + "2", &error));
+        EXPECT_THAT(error, AllOf(HasSubstr(path), HasSubstr("stop it first")));
         std::vector<std::thread> threads;
         for (int i = 0; i < 3; ++i) threads.emplace_back([&] { Work(*queue, 3000); });
         for (std::thread& thread : threads) thread.join();
-        SaveAndLoad(MakePath(".png"));
+        ASSERT_TRUE(SaveImage(Picture(6, 5), folder.Path("image.png")));
+        LoadImage(folder.Path("image.png"));
         // In one go, and one of them slow.
         Sleeper sleeper;
         queue->Call([&] {
@@ -154,9 +138,13 @@ TEST(TraceTest, TellsOfEveryThreadTaskFlushTransferAndFileOnce) {
         queue->WaitForTasks();
         statistics = RendererFactory::GetStatistics();
     }
+    EXPECT_EQ(statistics.drawRequests, 9000u);
+    EXPECT_GE(statistics.draws, 3u);
+    EXPECT_EQ(statistics.textures + statistics.renderTargets + statistics.graphicsObjects, 0);
+    EXPECT_EQ(statistics.errors, 0u);
     EXPECT_FALSE(Trace::IsOn());
-    Events const events(options.tracePath);
-    events.ExpectOrder();
+    Events const events(path);
+    events.ExpectNested();
     EXPECT_THAT(events.threads, Contains("moka-render"));
     EXPECT_EQ(events.threads.size(), 5u); // three, this one, and the render thread
     EXPECT_EQ(events.Sum("task", "DrawRectRT", "count"), 9000);
@@ -167,7 +155,7 @@ TEST(TraceTest, TellsOfEveryThreadTaskFlushTransferAndFileOnce) {
         bool const isSlow = event.at("dur").get<double>() >= 2000;
         EXPECT_TRUE(!isSlow || event.at("args").at("count") <= 8) << event;
     }
-    EXPECT_EQ(events.Sum("renderer", "Flush", "draws"), static_cast<std::int64_t>(statistics.drawRequests));
+    EXPECT_EQ(events.Sum("renderer", "Flush", "draws"), 9000);
     EXPECT_EQ(events.Sum("renderer", "Flush", "runs"), static_cast<std::int64_t>(statistics.draws));
     EXPECT_EQ(events.Sum("renderer", "Upload", "bytes"), 3 * 32 * 32 * 4);
     EXPECT_EQ(events.Sum("renderer", "ReadPixels", "bytes"), 3 * 32 * 32 * 4);
@@ -180,14 +168,10 @@ TEST(TraceTest, TellsOfEveryThreadTaskFlushTransferAndFileOnce) {
 }
 
 // One after the other; each into its own file.
-TEST(TraceTest, NothingIsLostWhenTheProcessEndsWithoutStopping) {
-    std::string const path = MakePath(".json");
-    auto const run = [&path] {
+TEST_F(TraceTest, NothingIsLostWhenTheProcessEndsWithoutStopping) {
+    auto const run = [this] {
         setenv("MOKA_TRACE", path.c_str(), 1);
-        for (int i = 0; i < 2; ++i) {
-            auto const queue = RenderThread::Start({}, nullptr);
-            Work(*queue, 100);
-        }
+        for (int i = 0; i < 2; ++i) Work(*RenderThread::Start({}, nullptr), 100);
         std::thread([] {
             for (std::uint64_t i = 0; i < 10000; ++i) TraceScope("test", "step", "number", i);
         }).join();
@@ -197,15 +181,14 @@ TEST(TraceTest, NothingIsLostWhenTheProcessEndsWithoutStopping) {
     };
     EXPECT_EXIT(run(), ::testing::ExitedWithCode(0), "");
     Events const events(path);
-    events.ExpectOrder();
+    events.ExpectNested();
     EXPECT_EQ(events.Sum("test", "step", "number"), 9999 * 10000 / 2);
     EXPECT_EQ(events.Find("test", "last").size(), 1u);
     EXPECT_EQ(events.Sum("task", "DrawRectRT", "count"), 200);
 }
 
-TEST(TraceTest, WhenTheDiskFillsTheEventsBeforeCanStillBeRead) {
-    std::string const path = MakePath(".json");
-    auto const run = [&path] {
+TEST_F(TraceTest, WhenTheDiskFillsTheEventsBeforeCanStillBeRead) {
+    auto const run = [this] {
         std::signal(SIGXFSZ, SIG_IGN);
         LogCapture const log;
         std::string error;

@@ -3,11 +3,13 @@
 #include "tests/support/TestFiles.h"
 #include "tests/unit/notebook/NotebookObjects.h"
 
+#include <atomic>
 #include <csignal>
 #include <cstdlib>
 #include <filesystem>
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
+#include <sys/mman.h>
 #include <sys/wait.h>
 #include <unistd.h>
 
@@ -30,13 +32,13 @@ protected:
         return document;
     }
     // Copies the current files and opens the copy, as after a kill.
-    Objects OpenCopy(std::string const& name = "copy") {
-        std::filesystem::remove_all(mFolder.Path(name));
-        std::filesystem::create_directories(mFolder.Path(name));
-        for (char const* const file : {"p.json", "p.json.journal"})
-            if (std::filesystem::exists(mFolder.Path(file)))
-                std::filesystem::copy_file(mFolder.Path(file), mFolder.Path(name + "/" + file));
-        return Open(mFolder.Path(name + "/p.json"))->GetPage().GetObjects();
+    Objects OpenCopy() {
+        std::string const folder = mFolder.Path("copy");
+        std::filesystem::remove_all(folder);
+        std::filesystem::create_directory(folder);
+        std::error_code isMissing;
+        for (std::string const& file : {mPath, mJournal}) std::filesystem::copy(file, folder, isMissing);
+        return Open(folder + "/p.json")->GetPage().GetObjects();
     }
     static void Autosave(Document& document) {
         while (document.Tick(0) >= 0 || document.IsBusy()) {
@@ -207,9 +209,9 @@ TEST_F(NotebookStoreTest, AFailedSaveIsReportedAndLosesNothing) {
     EXPECT_FALSE(document->Close());
 }
 
-// Adds strokes without a pause. After each save and autosave it sends the number of saved strokes through the pipe.
-[[noreturn]] void WriteUntilKilled(Document& document, int pipe) {
-    for (int count = 0;; ++count) {
+// Adds strokes without a pause, and stores after each save and autosave how many are on the disk.
+[[noreturn]] void WriteUntilKilled(Document& document, std::atomic<int>& kept) {
+    for (int count = 1;; ++count) {
         document.GetPage().Append(MakeDash(1, static_cast<float>(count)));
         if (count % 5 != 0) continue;
         if (count % 35 == 0)
@@ -217,36 +219,32 @@ TEST_F(NotebookStoreTest, AFailedSaveIsReportedAndLosesNothing) {
         else
             document.Tick(0), document.Tick(0);
         while (document.IsBusy()) usleep(100);
-        int const kept = count + 1;
-        if (write(pipe, &kept, sizeof(kept)) < 0) _exit(1);
+        kept = count;
     }
 }
 
 TEST_F(NotebookStoreTest, TwentyKillsAfter100MillisecondsLoseNothingThatWasWritten) {
+    void* const shared =
+        mmap(nullptr, sizeof(std::atomic<int>), PROT_READ | PROT_WRITE, MAP_SHARED | MAP_ANONYMOUS, -1, 0);
+    auto& kept = *new (shared) std::atomic<int>;
     int most = 0;
     for (int kill = 0; kill < 20; ++kill) {
-        for (char const* const file : {"p.json", "p.json.journal"})
-            std::filesystem::remove(mFolder.Path(file));
-        int ends[2];
-        ASSERT_EQ(pipe(ends), 0);
+        for (std::string const& file : {mPath, mJournal}) std::filesystem::remove(file);
+        kept = 0;
         pid_t const child = fork();
-        if (child == 0) WriteUntilKilled(*Open(mPath), ends[1]);
-        close(ends[1]);
+        if (child == 0) WriteUntilKilled(*Open(mPath), kept);
         usleep(100'000);
         ::kill(child, SIGKILL);
         waitpid(child, nullptr, 0);
-        int kept = 0;
-        while (read(ends[0], &kept, sizeof(kept)) == sizeof(kept)) {
-        }
-        close(ends[0]);
         Objects const found = OpenCopy();
         EXPECT_EQ(mTold, "");
         ASSERT_GE(found.size(), static_cast<std::size_t>(kept));
         for (std::size_t i = 0; i < found.size(); ++i)
-            ASSERT_TRUE(AreSame({found[i]}, {MakeDash(1, static_cast<float>(i))})) << i;
-        most = std::max(most, kept);
+            ASSERT_TRUE(AreSame({found[i]}, {MakeDash(1, static_cast<float>(i + 1))})) << i;
+        most = std::max<int>(most, kept);
     }
     EXPECT_GT(most, 0) << "no child reached its first autosave";
+    munmap(shared, sizeof(kept));
 }
 
 } // namespace

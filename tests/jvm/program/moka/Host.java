@@ -10,11 +10,11 @@ final class Host {
 
     private Host() {}
 
-    /** Width and height, four bytes each, then the pixels, R, G, B, A. Null when the file is not decoded. */
-    static native byte[] decodeThroughJava(String path, int width, int height);
+    /** The width in the upper half, the height in the lower one. 0 when the file is not decoded. */
+    static native long decodeThroughJava(String path, int width, int height);
 
-    /** The same by the native codecs. */
-    static native byte[] decodeNatively(String path);
+    /** Whether Java and the native codecs decode the file, to the same pixels. */
+    static native boolean isDecodedAlike(String path);
 
     /** What MKBitmapFactory_OnLoad returns. */
     static native int loadBridge();

@@ -3,7 +3,7 @@ package moka;
 import com.velmora.android.sdk.pen.view.MokaDisplay;
 
 /**
- * What System.loadLibrary does, and the life of a display. The loader's thread, which waits for ever, must not keep the
+ * What System.loadLibrary does, and the end of a display. The loader's thread, which waits for ever, must not keep the
  * process.
  */
 public final class LoadTest {
@@ -29,15 +29,6 @@ public final class LoadTest {
                 .count() == 1, "the loader's thread");
 
         MokaDisplay display = new MokaDisplay(1, 2, 3, 4, 5, 6, 7, 8, 9, 10, 11, 12, 13, true, 14);
-        display.setDebugLevel(-3);
-        display.updateScreenOrientation(99);
-        try (MokaDisplay copy = new MokaDisplay(0, 0, 2, 0, 0, 0, 0, 320, 0, 0, 0, 0, 0, false, 0)) {
-            copy.copy(display);
-            Host.expectThrown(NullPointerException.class, () -> {
-                copy.copy(null);
-                return null;
-            });
-        }
         display.close();
         display.close();
         Host.expectThrown(IllegalStateException.class, display::getHandle);

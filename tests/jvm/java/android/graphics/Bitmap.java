@@ -50,12 +50,4 @@ public class Bitmap {
         @Override
         public String toString() { throw new IllegalStateException("no comment"); }
     }
-
-    /** Complete but for the copy. */
-    public static class WithoutCopy {
-        public int getWidth() { return 1; }
-        public int getHeight() { return 1; }
-        public int getRowBytes() { return 4; }
-        public Config getConfig() { return Config.ARGB_8888; }
-    }
 }

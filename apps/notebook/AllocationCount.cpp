@@ -1,4 +1,4 @@
-#include "bench/canvas/AllocationCount.h"
+#include "apps/notebook/AllocationCount.h"
 
 #include "moka/base/Export.h"
 
@@ -11,11 +11,11 @@ thread_local std::uint64_t tAllocations = 0;
 
 } // namespace
 
-namespace Moka::Bench {
+namespace Moka {
 
 std::uint64_t CountAllocations() { return tAllocations; }
 
-} // namespace Moka::Bench
+} // namespace Moka
 
 // The other forms of operator new call this one.
 MOKA_API void* operator new(std::size_t size) {
