@@ -26,11 +26,12 @@ protected:
         options.surfaceWidth = options.surfaceHeight = surfaceSide;
         std::string error;
         thread = RenderThread::Start(options, &error);
-        EXPECT_TRUE(thread) << error;
+        EXPECT_TRUE(thread) << error; // and what follows ends the program
     }
-    void SetUp() override { ASSERT_TRUE(thread); }
-    void TearDown() override {
-        thread->WaitForTasks(); // what goes last posts the end of what it held
+    // When the members of the fixtures that derive from it are gone.
+    ~RenderThreadFixture() override {
+        thread->WaitForTasks();
+        thread->WaitForTasks(); // a canvas that goes last posts the end of its bitmap
         ExpectNothingLeft(RendererFactory::GetStatistics());
         thread.reset();
         for (std::string const& line : log.GetTexts(ANDROID_LOG_ERROR)) ADD_FAILURE() << line;

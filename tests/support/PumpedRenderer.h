@@ -10,18 +10,21 @@ namespace Moka::Testing {
 
 class PumpedRenderer : public HandPumpedQueue {
 public:
-    explicit PumpedRenderer(int maxTextureSize) {
+    explicit PumpedRenderer(int maxTextureSize, Predicate refuses = {})
+        : HandPumpedQueue(std::move(refuses)) {
         RendererTrace::Reset();
         RendererTrace::SetMaxTextureSize(maxTextureSize);
         RendererFactory::AttachContext();
         RendererTrace::DeclareNoRenderThread();
-        SetAroundRun([] { RendererTrace::DeclareRenderThread(); },
-                     [] { RendererTrace::DeclareNoRenderThread(); });
     }
     ~PumpedRenderer() override {
         RendererTrace::DeclareRenderThread();
         RendererFactory::DetachContext();
     }
+
+protected:
+    void BeforeRun() override { RendererTrace::DeclareRenderThread(); }
+    void AfterRun() override { RendererTrace::DeclareNoRenderThread(); }
 };
 
 } // namespace Moka::Testing

@@ -8,36 +8,15 @@ namespace {
 // The queue that is running a task on this thread.
 thread_local HandPumpedQueue const* tRunning = nullptr;
 
-class RunningScope {
-public:
-    RunningScope(HandPumpedQueue const* queue, std::function<void()> const& before,
-                 std::function<void()> const& after)
-        : mOuter(std::exchange(tRunning, queue)), mAfter(after) {
-        if (before) before();
-    }
-    ~RunningScope() {
-        if (mAfter) mAfter();
-        tRunning = mOuter;
-    }
-    RunningScope(RunningScope const&) = delete;
-    RunningScope& operator=(RunningScope const&) = delete;
-
-private:
-    HandPumpedQueue const* mOuter;
-    std::function<void()> const& mAfter;
-};
-
 } // namespace
-
-HandPumpedQueue::~HandPumpedQueue() = default;
 
 bool HandPumpedQueue::Post(ITask* task) {
     std::lock_guard<std::mutex> lock(mMutex);
     if (!task) return true;
-    bool const isRefused = mRefuses(++mOffered, task);
-    mRefused += isRefused ? 1 : 0;
-    if (!isRefused) mTasks.emplace_back(task);
-    return !isRefused;
+    if (mRefuses && mRefuses()) return false;
+    mTasks.emplace_back(task);
+    ++mPosted;
+    return true;
 }
 
 void HandPumpedQueue::WaitForTasks() {
@@ -47,11 +26,6 @@ void HandPumpedQueue::WaitForTasks() {
         ++mWaits;
     }
     RunAll();
-}
-
-void HandPumpedQueue::SetAroundRun(std::function<void()> before, std::function<void()> after) {
-    mBeforeRun = std::move(before);
-    mAfterRun = std::move(after);
 }
 
 std::unique_ptr<ITask> HandPumpedQueue::TakeFirst() {
@@ -66,7 +40,17 @@ std::unique_ptr<ITask> HandPumpedQueue::TakeFirst() {
 bool HandPumpedQueue::RunOne() {
     std::unique_ptr<ITask> task = TakeFirst();
     if (!task) return false;
-    RunningScope scope(this, mBeforeRun, mAfterRun);
+    struct Scope {
+        explicit Scope(HandPumpedQueue& q) : queue(q), outer(std::exchange(tRunning, &q)) {
+            queue.BeforeRun();
+        }
+        ~Scope() {
+            queue.AfterRun();
+            tRunning = outer;
+        }
+        HandPumpedQueue& queue;
+        HandPumpedQueue const* const outer;
+    } const scope(*this);
     // Freed inside the scope: what the task owns dies on the render thread too.
     std::unique_ptr<ITask> const running = std::move(task);
     running->run();

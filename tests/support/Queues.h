@@ -17,15 +17,10 @@ namespace Moka::Testing {
 // Fails:  an exception out of a task reaches the caller of Run...; the task is freed and counts as run.
 class HandPumpedQueue : public IGLMsgQueue {
 public:
-    // Whether a task is refused; ordinal counts the tasks offered, from 1. Asked under the queue's lock: it must not
-    // use the queue.
-    using Predicate = std::function<bool(int ordinal, ITask* task)>;
+    // Whether the next task is refused. Asked under the queue's lock: it must not use the queue.
+    using Predicate = std::function<bool()>;
 
-    explicit HandPumpedQueue(Predicate refuses = [](int, ITask*) { return false; })
-        : mRefuses(std::move(refuses)) {}
-    ~HandPumpedQueue() override;
-    HandPumpedQueue(HandPumpedQueue const&) = delete;
-    HandPumpedQueue& operator=(HandPumpedQueue const&) = delete;
+    explicit HandPumpedQueue(Predicate refuses = {}) : mRefuses(std::move(refuses)) {}
 
     // A null task is accepted and forgotten.
     bool Post(ITask* task) override;
@@ -34,51 +29,32 @@ public:
     // the deadlock that a real queue would have: nothing runs, and it is not counted.
     void WaitForTasks() override;
 
-    // Calls around each run, so that a test can declare its thread the render thread meanwhile.
-    void SetAroundRun(std::function<void()> before, std::function<void()> after);
-
     bool RunOne(); // false when nothing is stored
     int RunAll();  // also what the tasks post; returns how many
 
-    int GetPendingCount() const {
-        return Read([this] { return static_cast<int>(mTasks.size()); });
-    }
-    int GetPostedCount() const {
-        return Read([this] { return mOffered - mRefused; });
-    } // accepted tasks
-    int GetRunCount() const {
-        return Read([this] { return mRun; });
-    }
-    int GetRefusedCount() const {
-        return Read([this] { return mRefused; });
-    }
-    int GetWaitCount() const {
-        return Read([this] { return mWaits; });
-    }
+    int GetPendingCount() const { return GetPostedCount() - GetRunCount(); }
+    int GetPostedCount() const { return Read(mPosted); } // accepted tasks
+    int GetRunCount() const { return Read(mRun); }
+    int GetWaitCount() const { return Read(mWaits); }
+
+protected:
+    // Around each task.
+    virtual void BeforeRun() {}
+    virtual void AfterRun() {}
 
 private:
-    template <class Value>
-    int Read(Value const& value) const {
+    int Read(int const& count) const {
         std::lock_guard<std::mutex> lock(mMutex);
-        return value();
+        return count;
     }
     std::unique_ptr<ITask> TakeFirst();
 
     Predicate const mRefuses;
     std::mutex mutable mMutex;
     std::deque<std::unique_ptr<ITask>> mTasks;
-    int mOffered = 0;
     int mRun = 0;
-    int mRefused = 0;
+    int mPosted = 0;
     int mWaits = 0;
-    std::function<void()> mBeforeRun;
-    std::function<void()> mAfterRun;
-};
-
-// RefusingQueue: refuses every task, or those that a test chooses.
-struct RefusingQueue final : HandPumpedQueue {
-    explicit RefusingQueue(Predicate refuses = [](int, ITask*) { return true; })
-        : HandPumpedQueue(std::move(refuses)) {}
 };
 
 } // namespace Moka::Testing

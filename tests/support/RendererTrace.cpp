@@ -66,14 +66,13 @@ PipelineState ReadState(RequestedState& state) {
 // What a reset forgets.
 struct Notes {
     bool keepsRecords = true;
-    std::vector<TracedCall> calls;
+    std::vector<std::string> calls;
     std::vector<TracedEvent> events;
     std::vector<std::string> violations;
     int creations = 0;
     std::set<int> failingCreations;
     std::set<ObjectKind> failingKinds;
     std::map<ObjectKind, int> lastNumber;
-    std::map<int, void const*> boundTextures;
 };
 
 // Everything that is known, under one lock: an operation that the renderer calls takes it, the others are for its
@@ -104,7 +103,6 @@ public:
         Note(request.kind, request.object, request.operation, arguments.str());
         if (operation == "GetParameter") ++liveHandles;
         if (operation == "ReleaseParameter") --liveHandles;
-        if (operation == "Bind") notes.boundTextures[int(request.values.begin()->integer)] = request.object;
         if (operation == "Release") End(request.object);
     }
 
@@ -125,16 +123,13 @@ public:
         std::lock_guard const lock(mutex);
         if (!notes.keepsRecords) return;
         auto draw = MakeEvent<TracedDraw>(request.state, GetAttachedRecorder()->GetActive());
-        draw.primitive = request.primitive;
         std::ptrdiff_t const floats = std::ptrdiff_t{request.count} * request.floatsPerVertex;
         if (floats > 0) draw.vertices.assign(request.vertices, request.vertices + floats);
-        draw.floatsPerVertex = request.floatsPerVertex;
         draw.first = request.first;
         draw.count = request.count;
         draw.shader = request.state.GetProgram()->GetLabel();
         void const* const program = FindProgram(request.state);
         if (program) draw.uniforms = objects[program].values;
-        for (auto const& [unit, texture] : notes.boundTextures) draw.textures[unit] = NameOf(texture);
         notes.events.emplace_back(std::move(draw));
     }
 
@@ -191,13 +186,13 @@ private:
     }
 
     // Writes the request down and looks whether it may come now.
-    void Note(ObjectKind kind, void const* address, std::string_view operation, std::string arguments) {
+    void Note(ObjectKind kind, void const* address, std::string_view operation,
+              std::string const& arguments) {
         TracedObject const* const object = Find(address);
-        std::string const who = object ? object->GetName() : NameOfKind(kind);
-        if (notes.keepsRecords) notes.calls.push_back({who, std::string(operation), std::move(arguments)});
-        auto const violate = [&](char const* what) {
-            notes.violations.push_back(who + " " + std::string(operation) + what);
-        };
+        std::string const call =
+            (object ? object->GetName() : NameOfKind(kind)) + " " + std::string(operation);
+        if (notes.keepsRecords) notes.calls.push_back(call + (arguments.empty() ? "" : " " + arguments));
+        auto const violate = [&](char const* what) { notes.violations.push_back(call + what); };
         bool const isReleased = address && (!object || object->released);
         // A handle may outlive its program.
         if (isReleased && operation != "ReleaseParameter") return violate(" after its release");
@@ -217,10 +212,6 @@ private:
                 notes.violations.push_back(object->GetName() + " released while attached to " +
                                            NameOf(target));
             }
-        }
-        auto& bound = notes.boundTextures;
-        for (auto unit = bound.begin(); unit != bound.end();) {
-            unit = unit->second == address ? bound.erase(unit) : std::next(unit);
         }
         object->released = true;
         if (!notes.keepsRecords) objects.erase(address);
@@ -265,10 +256,6 @@ void SetCaps(DeviceCaps const& caps) {
 
 } // namespace
 
-std::string ToString(TracedCall const& call) {
-    return call.object + " " + call.operation + (call.arguments.empty() ? "" : " " + call.arguments);
-}
-
 void RendererTrace::Reset() {
     RendererFactory::DetachContext();
     SetCaps(TracingDevice::MakeCaps());
@@ -277,21 +264,7 @@ void RendererTrace::Reset() {
     trace->notes = {};
 }
 
-std::vector<TracedCall> RendererTrace::GetCalls() { return Access()->notes.calls; }
-
-std::vector<std::string> RendererTrace::TakeCalls() {
-    Access const trace;
-    std::vector<std::string> lines;
-    for (TracedCall const& call : std::exchange(trace->notes.calls, {})) lines.push_back(ToString(call));
-    return lines;
-}
-
-int RendererTrace::CountCalls(std::string const& operation) {
-    std::vector<TracedCall> const calls = GetCalls();
-    return static_cast<int>(std::count_if(
-        calls.begin(), calls.end(), [&](TracedCall const& call) { return call.operation == operation; }));
-}
-
+std::vector<std::string> RendererTrace::TakeCalls() { return std::exchange(Access()->notes.calls, {}); }
 std::vector<TracedDraw> RendererTrace::GetDraws() { return GetEventsOf<TracedDraw>(); }
 std::vector<TracedClear> RendererTrace::GetClears() { return GetEventsOf<TracedClear>(); }
 std::vector<TracedEvent> RendererTrace::TakeEvents() { return std::exchange(Access()->notes.events, {}); }
@@ -340,8 +313,6 @@ void RendererTrace::StopFailing() {
 void RendererTrace::DeclareRenderThread() { Access()->renderThread = std::this_thread::get_id(); }
 void RendererTrace::DeclareNoRenderThread() { Access()->renderThread = {}; }
 
-std::string RendererTrace::NameOf(void const* object) { return Access()->NameOf(object); }
-
 std::vector<unsigned char> RendererTrace::GetTexels(ITextureObject const* texture) {
     TextureStorage const& storage = *static_cast<TextureObject const*>(texture)->GetStorage();
     Recorder& recorder = *storage.GetRecorder();
@@ -357,7 +328,7 @@ int RendererTrace::GetParameter(ITextureObject const* texture, int id) {
 
 std::string RendererTrace::GetActiveTarget() {
     Recorder const* const recorder = GetAttachedRecorder();
-    return NameOf(recorder ? recorder->GetActive() : nullptr);
+    return Access()->NameOf(recorder ? recorder->GetActive() : nullptr);
 }
 
 int RendererTrace::CountLiveObjects() {
@@ -375,7 +346,6 @@ std::unique_ptr<Device> MakeDevice(RendererProcLoader, Counters& counters) {
     Testing::Access const trace;
     ++trace->context;
     trace->renderThread = std::this_thread::get_id();
-    trace->notes.boundTextures.clear();
     return std::make_unique<Testing::TracingDevice>(counters);
 }
 

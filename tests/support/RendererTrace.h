@@ -45,16 +45,13 @@ struct TracedUniform {
 
 struct TracedDraw {
     PipelineState state;
-    std::string target; // "target 1"; "none" when nothing is active
-    PrimitiveType primitive = PrimitiveType::TriangleList;
+    std::string target;          // "target 1"; "none" when nothing is active
     std::vector<float> vertices; // those drawn, first and count applied; empty when nothing was
-    int floatsPerVertex = 0;
-    int first = 0; // of the vertices handed over
-    int count = 0; // that were there and were drawn
+    int first = 0;               // of the vertices handed over
+    int count = 0;               // that were there and were drawn
 
     std::string shader;                            // the name its creator gave it
     std::map<std::string, TracedUniform> uniforms; // those ever set, by name
-    std::map<int, std::string> textures;           // "texture 1" by unit
 };
 
 struct TracedClear {
@@ -65,20 +62,6 @@ struct TracedClear {
 
 using TracedEvent = std::variant<TracedDraw, TracedClear>;
 
-// One request. Objects are named by kind and number in order of creation: "texture 1", "target 1", "buffer 1",
-// "program 1", "graphics 1", "blend 1", "depthstencil 1"; static functions belong to "renderer", those of the
-// scissor to "rasterizer". Operations are named as in the interfaces; the deletion of a texture is its
-// "Release", a creation is the new object's "Create"; what is done to a handle on a parameter is an operation
-// of its program: "program 1 SetParameter uFactor 0.5", "program 1 ReleaseParameter uFactor".
-struct TracedCall {
-    std::string object;
-    std::string operation;
-    std::string arguments; // separated by spaces
-};
-
-// "texture 1 SetParameter 4 1"
-std::string ToString(TracedCall const& call);
-
 class RendererTrace {
 public:
     // Back to the beginning: no context, no calls, no violations, no planned failures, the usual capabilities,
@@ -86,10 +69,13 @@ public:
     // context, if there is one.
     static void Reset();
 
-    static std::vector<TracedCall> GetCalls();
-    // The calls as lines, which are then forgotten.
+    // The requests so far, which are then forgotten: "texture 1 SetParameter 4 1". Objects are named by kind and number
+    // in order of creation: "texture 1", "target 1", "buffer 1", "program 1", "graphics 1", "blend 1", "depthstencil 1";
+    // static functions belong to "renderer", those of the scissor to "rasterizer". Operations are named as in the
+    // interfaces; the deletion of a texture is its "Release", a creation is the new object's "Create"; what is done to a
+    // handle on a parameter is an operation of its program: "program 1 SetParameter uFactor 0.5", "program 1
+    // ReleaseParameter uFactor".
     static std::vector<std::string> TakeCalls();
-    static int CountCalls(std::string const& operation);
 
     // The draws and the clears, as values, in order. A draw without a current program is none, one of no vertices is
     // one.
@@ -122,9 +108,6 @@ public:
     static void DeclareRenderThread(); // the calling thread
     static void DeclareNoRenderThread();
 
-    // The name in the calls, for a pointer to any interface of the renderer; "none" for null. Still valid after
-    // the object's release, until its memory is used again.
-    static std::string NameOf(void const* object);
     // The image, rows packed, in texture order.
     static std::vector<unsigned char> GetTexels(ITextureObject const* texture);
     // The value last set, or the initial one; -1 for an id that names no parameter.

@@ -1,11 +1,8 @@
-// Bitmaps on a real driver: what goes up comes back, over strips, shared or not, and nothing stays behind.
+// Bitmaps on a real driver: what goes up comes back, over strips, and nothing stays behind.
 #include "moka/graphics/bitmap/IMKBitmap.h"
-#include "moka/graphics/bitmap/IMKSubBitmap.h"
 #include "moka/graphics/bitmap/IMKTextureBitmap.h"
 #include "tests/pixel/RenderThreadFixture.h"
 #include "tests/support/ImageCompare.h"
-#include "tests/support/Queues.h"
-#include "tests/support/TestFiles.h"
 
 #include <cstring>
 #include <gtest/gtest.h>
@@ -63,56 +60,6 @@ TEST_F(PixelBitmap, ReadsBlocksOverStripEdgesAndPartlyOutsideAndReplacesABlockOf
     Picture const wide = MakeAlphaPattern(30, 20);
     bitmap->GetTextureBitmap()->UpdateBitmap(Rect(5, 2, 15, 9), wide.pixels.data(), wide.GetStride());
     ExpectSame(Read(bitmap, Rect(5, 2, 15, 9)), wide.Crop(0, 0, 10, 7));
-}
-
-TEST_F(PixelBitmap, AShareSeesUpdatesWhoeverGoesFirstAndAStripsCloneDoesNot) {
-    Picture const image = MakeGradient(33, kMaxSide + 3);
-    Picture const other = MakeChecker(33, kMaxSide + 3, 2, {255, 0, 0, 255}, {0, 0, 255, 255});
-    for (bool parentFirst : {true, false}) {
-        auto parent = Create(image);
-        auto clone = BitmapPtr::Adopt(parent->Clone());
-        IMKSubBitmap* const strip = parent->GetTextureBitmap()->GetSubBitmap(0);
-        strip->SetTag("strip");
-        auto const copy = RefPtr<IMKSubBitmap>::Adopt(strip->Clone());
-        clone->GetTextureBitmap()->UpdateBitmap(other.pixels.data(), other.GetStride());
-        (parentFirst ? parent : clone) = {};
-        auto const fresh = Create(image); // a GL name deleted twice would now be this one's
-        ExpectSame(Read(parentFirst ? clone : parent), other);
-        ExpectSame(Read(fresh), image);
-        Picture read(33, kMaxSide);
-        copy->GetBitmapData(Rect(0, 0, 33, kMaxSide), read.pixels.data());
-        ExpectSame(read, image.Crop(0, 0, 33, kMaxSide));
-    }
-}
-
-TEST_F(PixelBitmap, ASavedBitmapIsLoadedWithEveryPixelAndAMissingFileSaysWhy) {
-    TempFolder const folder;
-    Picture const image = MakeAlphaPattern(20, 2 * kMaxSide + 1);
-    std::string reason;
-    ASSERT_TRUE(SaveBitmap(*Create(image), folder.Path("picture.mki"), 100, &reason)) << reason;
-    ExpectSame(Read(LoadBitmap(*thread, folder.Path("picture.mki"))), image);
-
-    EXPECT_FALSE(SaveBitmap(*Create(image), folder.Path("picture.bmp"), 100, &reason));
-    EXPECT_NE(reason.find("unknown extension 'bmp'"), std::string::npos) << reason;
-    EXPECT_FALSE(LoadBitmap(*thread, folder.Path("missing.png"), &reason));
-    EXPECT_NE(reason.find("No such file"), std::string::npos) << reason;
-
-    ASSERT_TRUE(thread->Call([&] {
-        bool refuse = false;
-        RefusingQueue refusing(RefusingQueue::Predicate([&](int, ITask*) { return refuse; }));
-        {
-            auto const unread = NewBitmap(refusing, 4, 4);
-            refuse = true; // as a queue that was stopped does
-            EXPECT_FALSE(SaveBitmap(*unread, folder.Path("picture.mki"), 100, &reason));
-            EXPECT_NE(reason.find("refuses"), std::string::npos) << reason;
-            refuse = false;
-            IMKSubBitmap* const strip = unread->GetTextureBitmap()->GetSubBitmap(0);
-            for (int read = 0; read < 2; ++read) strip->Unref(); // the references of the refused tasks
-        }
-        refusing.RunAll();
-    }));
-    ExpectSame(Read(LoadBitmap(*thread, folder.Path("picture.mki"))), image);
-    log.Clear();
 }
 
 } // namespace

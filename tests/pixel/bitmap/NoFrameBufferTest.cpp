@@ -37,28 +37,23 @@ private:
 
 class NoFrameBuffer : public RenderThreadFixture {
 protected:
-    NoFrameBuffer() : RenderThreadFixture(kMaxSide, kSide) {}
-
-    void SetUp() override {
-        RenderThreadFixture::SetUp();
-        queue = std::make_unique<PickyQueue>(*thread);
+    NoFrameBuffer() : RenderThreadFixture(kMaxSide, kSide) {
         thread->Call([this] {
             window = RendererFactory::CreateRenderTargetFromDefault(kSide, kSide);
             window->ClearColor(0.2f, 0.4f, 0.6f, 1);
         });
     }
-    void TearDown() override {
+    ~NoFrameBuffer() override {
         thread->Call([this] { window->Release(); });
-        RenderThreadFixture::TearDown();
     }
 
     BitmapPtr Create(int width, int height, void const* pixels = nullptr) {
-        return NewBitmap(*queue, width, height, pixels);
+        return NewBitmap(queue, width, height, pixels);
     }
 
     // All that need no pen, with their bitmaps or without.
     void DrawScenes(RefPtr<IMKCanvas> const& canvas) {
-        Scenes::QueueStage stage(*queue);
+        Scenes::QueueStage stage(queue);
         for (Scenes::Scene const& scene : Scenes::GetScenes())
             if (!scene.needsPen) DrawScene(scene, *canvas, stage);
     }
@@ -74,12 +69,12 @@ protected:
         EXPECT_EQ(CompareImages(expected, ReadWindow()).differingPixels, 0) << what;
     }
 
-    std::unique_ptr<PickyQueue> queue;
+    PickyQueue queue{*thread};
     IRenderTarget* window = nullptr;
 };
 
 TEST_F(NoFrameBuffer, OfABitmapThatIsTooWideNothingIsDrawnAndOneErrorTellsOfIt) {
-    DrawScenes(NewCanvas(*queue, Create(kMaxSide + 1, kSide)));
+    DrawScenes(NewCanvas(queue, Create(kMaxSide + 1, kSide)));
     ExpectWindowUntouched("too wide");
     EXPECT_EQ(log.Count(ANDROID_LOG_ERROR), 1);
     EXPECT_EQ(log.Count(ANDROID_LOG_ERROR, "1025 x 64 is refused"), 1);
@@ -88,14 +83,14 @@ TEST_F(NoFrameBuffer, OfABitmapThatIsTooWideNothingIsDrawnAndOneErrorTellsOfIt) 
 
 TEST_F(NoFrameBuffer, OfABitmapThatIsRefusedOrYetToBeCreatedNothingIsDrawn) {
     for (bool const texture : {true, false}) {
-        if (texture) queue->Refuse(1);
+        if (texture) queue.Refuse(1);
         BitmapPtr const bitmap = Create(kSide, kSide);
-        if (!texture) queue->Refuse(1);
-        DrawScenes(NewCanvas(*queue, bitmap));
+        if (!texture) queue.Refuse(1);
+        DrawScenes(NewCanvas(queue, bitmap));
         ExpectWindowUntouched(texture ? "no texture" : "no frame buffer");
         bitmap->GetTextureBitmap()->GetSubBitmap(0)->Unref(); // the reference of the refused task
     }
-    thread->Call([this] { DrawScenes(NewCanvas(*queue, Create(kSide, kSide), UseFrom::RenderThread)); });
+    thread->Call([this] { DrawScenes(NewCanvas(queue, Create(kSide, kSide), UseFrom::RenderThread)); });
     ExpectWindowUntouched("too early");
 }
 
@@ -103,7 +98,7 @@ TEST_F(NoFrameBuffer, WhatTheHostDrawsItselfWithoutATargetReachesItsWindow) {
     Picture const white = MakeChecker(8, 8, 1, {255, 255, 255, 255}, {255, 255, 255, 255});
     BitmapPtr const source = Create(8, 8, white.pixels.data());
     auto const custom =
-        RefPtr<MKNonPremultipliedColorDrawable>::Adopt(new MKNonPremultipliedColorDrawable(queue.get()));
+        RefPtr<MKNonPremultipliedColorDrawable>::Adopt(new MKNonPremultipliedColorDrawable(&queue));
     custom->SetBitmap(source.Get(), source.Get());
     thread->Call([&] { custom->DrawRT(Matrix4<float>(), MKPaint()); });
     EXPECT_EQ(ReadWindow().GetColor(kSide - 1, kSide - 1), (Color{255, 255, 255, 255}));

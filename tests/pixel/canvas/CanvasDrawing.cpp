@@ -111,7 +111,7 @@ void CanvasDrawing::UseLargestSide(int side) { mSide = side; }
 
 RenderThread& CanvasDrawing::GetRenderThread() const { return *GetRenderer().Use(mSide); }
 
-void CanvasDrawing::TearDown() {
+CanvasDrawing::~CanvasDrawing() {
     GetRenderThread().WaitForTasks();
     GetRenderThread().WaitForTasks(); // a canvas that goes last posts the end of its bitmap
     ExpectNothingLeft(RendererFactory::GetStatistics(), kept);

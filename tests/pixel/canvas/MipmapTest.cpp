@@ -113,20 +113,7 @@ protected:
     static constexpr int kSide = 160;
     static constexpr int kSmall = 16;
 
-    MipmapChangeTest()
-        : bitmap(NewBitmap(GetRenderThread(), kSide, kSide)),
-          onto(NewCanvas(GetRenderThread(), bitmap)),
-          target(NewBitmap(GetRenderThread(), kSmall * 8, kSmall)),
-          canvas(NewCanvas(GetRenderThread(), target)) {
-        bitmap->GetBitmapReadable()->SetTextureFilter(TextureFilterMipmapped);
-        before = CountUpdates(GetRenderThread());
-    }
-
-    void TearDown() override {
-        for (RefPtr<IMKCanvas>* const one : {&onto, &canvas}) *one = RefPtr<IMKCanvas>();
-        for (RefPtr<IMKBitmap>* const one : {&bitmap, &target}) *one = RefPtr<IMKBitmap>();
-        MipmapTest::TearDown();
-    }
+    MipmapChangeTest() { bitmap->GetBitmapReadable()->SetTextureFilter(TextureFilterMipmapped); }
 
     void DrawNext(IMKBitmap* shown = nullptr) {
         float const x = static_cast<float>(kSmall * next++);
@@ -142,11 +129,11 @@ protected:
     }
     std::uint64_t CountNewUpdates() { return CountUpdates(GetRenderThread()) - before; }
 
-    RefPtr<IMKBitmap> bitmap;
-    RefPtr<IMKCanvas> onto; // bitmap
-    RefPtr<IMKBitmap> target;
-    RefPtr<IMKCanvas> canvas;
-    std::uint64_t before;
+    RefPtr<IMKBitmap> bitmap = NewBitmap(GetRenderThread(), kSide, kSide);
+    RefPtr<IMKCanvas> onto = NewCanvas(GetRenderThread(), bitmap);
+    RefPtr<IMKBitmap> target = NewBitmap(GetRenderThread(), kSmall * 8, kSmall);
+    RefPtr<IMKCanvas> canvas = NewCanvas(GetRenderThread(), target);
+    std::uint64_t const before = CountUpdates(GetRenderThread());
     int next = 0;
 
     static constexpr Color kRed{255, 0, 0, 255};

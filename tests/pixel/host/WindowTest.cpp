@@ -1,11 +1,12 @@
 // Render threads over windows of an X server: what is presented is what the server shows, and what goes wrong
 // with a window is told and ends nothing else.
-#include "moka/base/RefPtr.h"
 #include "moka/base/log/AndroidLog.h"
-#include "moka/graphics/MokaGraphics.h"
+#include "moka/graphics/factory/BitmapsAndCanvases.h"
+#include "moka/graphics/paint/MKPaint.h"
 #include "moka/host/RenderThread.h"
 #include "tests/pixel/host/XWindow.h"
 #include "tests/support/LogCapture.h"
+#include "tests/support/TestFiles.h"
 
 #include <gmock/gmock.h>
 
@@ -44,9 +45,7 @@ int ToArgb(unsigned long color) { return static_cast<int>(0xFF000000u | static_c
 
 // The default frame buffer of a thread, filled: a stripe of 8 pixels above, the rest below.
 void Fill(RenderThread& queue, int width, int height, unsigned long above, unsigned long below) {
-    auto const screen =
-        RefPtr<IMKBitmap>::Adopt(MKGraphicsFactory::CreateScreenBitmap(&queue, 0, 0, width, height, 1, 1));
-    auto const canvas = RefPtr<IMKCanvas>::Adopt(MKGraphicsFactory::CreateCanvas(&queue, screen.Get(), 1));
+    auto const canvas = NewCanvas(queue, NewScreenBitmap(queue, width, height));
     canvas->ClearAll(ToArgb(below));
     MKPaint paint;
     paint.SetColor(ToArgb(above));
@@ -56,10 +55,9 @@ void Fill(RenderThread& queue, int width, int height, unsigned long above, unsig
 class WindowTest : public ::testing::Test {
 protected:
     void SetUp() override {
-        window = XWindow::Open(kWidth, kHeight);
-        if (!window) GTEST_SKIP() << "no X server; run under xvfb-run";
-        options.nativeWindow = window->GetWindow();
-        options.nativeDisplay = window->GetDisplay();
+        if (!window.GetDisplay()) GTEST_SKIP() << "no X server; run under xvfb-run";
+        options.nativeWindow = window.GetWindow();
+        options.nativeDisplay = window.GetDisplay();
         options.debugContext = true;
         Start();
         if (thread && thread->GetContextInfo().renderer.find("ANGLE") != std::string::npos)
@@ -74,11 +72,7 @@ protected:
 
     // The server shows a presented image a moment later.
     bool ShowsSoon(int x, int y, unsigned long color) const {
-        for (int i = 0; i < 500; ++i) {
-            if (window->GetPixel(x, y) == color) return true;
-            std::this_thread::sleep_for(milliseconds(10));
-        }
-        return false;
+        return Soon([&] { return window.GetPixel(x, y) == color; });
     }
 
     // Tasks posted from now on wait until the result is set.
@@ -100,7 +94,7 @@ protected:
     }
 
     LogCapture log;
-    std::unique_ptr<XWindow> window;
+    XWindow window{kWidth, kHeight};
     RenderThreadOptions options;
     std::string error;
     std::unique_ptr<RenderThread> thread;
@@ -117,7 +111,7 @@ TEST_F(WindowTest, WhatIsDrawnOnAScreenBitmapIsShownWhenPresented) {
 
     Fill(*thread, kWidth, kHeight, kGreen, kGreen);
     thread->WaitForTasks();
-    EXPECT_EQ(window->GetPixel(5, 5), kRed); // drawn, not presented
+    EXPECT_EQ(window.GetPixel(5, 5), kRed); // drawn, not presented
     EXPECT_TRUE(thread->Present());
     EXPECT_TRUE(ShowsSoon(5, 5, kGreen));
     EXPECT_THAT(log.GetTexts(ANDROID_LOG_ERROR), ElementsAre());
@@ -172,7 +166,7 @@ TEST_F(WindowTest, AWindowThatGrowsAndShrinksWhileFramesAreDrawnShowsTheNextFram
         }
     });
     for (Size const size : {Size{200, 150}, Size{40, 30}, Size{300, 20}, Size{30, 200}, Size{200, 150}}) {
-        window->Resize(size.width, size.height); // frames of the old size are still coming
+        window.Resize(size.width, size.height); // frames of the old size are still coming
         std::this_thread::sleep_for(milliseconds(20));
         drawn = size;
         for (int const x : {1, size.width - 2}) {
@@ -193,18 +187,15 @@ TEST_F(WindowTest, AWindowThatIsDestroyedWhileFramesWaitIsOneLineAndTheThreadGoe
     EXPECT_TRUE(thread->Present());
     EXPECT_TRUE(thread->Present());
     std::thread waiter([&] { thread->Present(); }); // refused, or posted before anybody knew
-    window->Destroy();
+    window.Destroy();
     gate.set_value();
     waiter.join();
     thread->WaitForTasks();
     EXPECT_FALSE(thread->Present());
     EXPECT_THAT(log.GetTexts(ANDROID_LOG_ERROR), ElementsAre(HasSubstr("destroyed")));
 
-    auto const bitmap = RefPtr<IMKBitmap>::Adopt(
-        MKGraphicsFactory::CreateBitmap(thread.get(), 4, 4, nullptr, false, 1, false));
-    auto const canvas =
-        RefPtr<IMKCanvas>::Adopt(MKGraphicsFactory::CreateCanvas(thread.get(), bitmap.Get(), 1));
-    canvas->ClearAll(ToArgb(kRed));
+    auto const bitmap = NewBitmap(*thread, 4, 4);
+    NewCanvas(*thread, bitmap)->ClearAll(ToArgb(kRed));
     Fill(*thread, kWidth, kHeight, kBlue, kBlue); // into nothing
     unsigned pixels[16] = {};
     bitmap->GetBitmapData(bitmap->GetBitmapRect(), pixels);

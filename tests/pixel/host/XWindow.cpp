@@ -7,49 +7,43 @@
 
 namespace Moka::Testing {
 
-struct XWindow::Impl {
-    ::Display* display;
-    ::Window window;
-};
+namespace {
 
-std::unique_ptr<XWindow> XWindow::Open(int width, int height) {
+::Display* Connect() {
     XInitThreads(); // the render thread uses the connection too
-    ::Display* const display = XOpenDisplay(nullptr);
-    if (!display) return nullptr;
-    auto const w = static_cast<unsigned>(width);
-    auto const h = static_cast<unsigned>(height);
-    ::Window const window = XCreateSimpleWindow(display, DefaultRootWindow(display), 0, 0, w, h, 0, 0, 0);
-    XSelectInput(display, window, StructureNotifyMask);
-    XMapWindow(display, window);
-    XEvent event;
-    do XNextEvent(display, &event);
-    while (event.type != MapNotify);
-    return std::unique_ptr<XWindow>(new XWindow(std::make_unique<Impl>(Impl{display, window})));
+    return XOpenDisplay(nullptr);
 }
 
-XWindow::XWindow(std::unique_ptr<Impl> impl) : mImpl(std::move(impl)) {}
+} // namespace
+
+XWindow::XWindow(int width, int height) : mDisplay(Connect()) {
+    if (!mDisplay) return;
+    mWindow = XCreateSimpleWindow(mDisplay, DefaultRootWindow(mDisplay), 0, 0, static_cast<unsigned>(width),
+                                  static_cast<unsigned>(height), 0, 0, 0);
+    XSelectInput(mDisplay, mWindow, StructureNotifyMask);
+    XMapWindow(mDisplay, mWindow);
+    XEvent event;
+    do XNextEvent(mDisplay, &event);
+    while (event.type != MapNotify);
+}
 
 XWindow::~XWindow() {
-    if (mImpl->window != 0) XDestroyWindow(mImpl->display, mImpl->window);
-    XCloseDisplay(mImpl->display);
+    if (mWindow != 0) XDestroyWindow(mDisplay, mWindow);
+    if (mDisplay) XCloseDisplay(mDisplay);
 }
 
 void XWindow::Resize(int width, int height) {
-    XResizeWindow(mImpl->display, mImpl->window, static_cast<unsigned>(width), static_cast<unsigned>(height));
-    XSync(mImpl->display, False);
+    XResizeWindow(mDisplay, mWindow, static_cast<unsigned>(width), static_cast<unsigned>(height));
+    XSync(mDisplay, False);
 }
 
 void XWindow::Destroy() {
-    XDestroyWindow(mImpl->display, std::exchange(mImpl->window, 0));
-    XSync(mImpl->display, False);
+    XDestroyWindow(mDisplay, std::exchange(mWindow, 0));
+    XSync(mDisplay, False);
 }
 
-void* XWindow::GetDisplay() const { return mImpl->display; }
-
-std::uintptr_t XWindow::GetWindow() const { return mImpl->window; }
-
 unsigned long XWindow::GetPixel(int x, int y) const {
-    XImage* const image = XGetImage(mImpl->display, mImpl->window, x, y, 1, 1, AllPlanes, ZPixmap);
+    XImage* const image = XGetImage(mDisplay, mWindow, x, y, 1, 1, AllPlanes, ZPixmap);
     unsigned long const pixel = XGetPixel(image, 0, 0) & 0xFFFFFF;
     XDestroyImage(image);
     return pixel;

@@ -3,20 +3,21 @@
 #pragma once
 
 #include <cstdint>
-#include <memory>
+
+struct _XDisplay;
 
 namespace Moka::Testing {
 
 class XWindow {
 public:
-    // Mapped. Null without a server.
-    static std::unique_ptr<XWindow> Open(int width, int height);
+    // Mapped. Without a server there is no display.
+    XWindow(int width, int height);
     ~XWindow();
     XWindow(XWindow const&) = delete;
     XWindow& operator=(XWindow const&) = delete;
 
-    void* GetDisplay() const;
-    std::uintptr_t GetWindow() const;
+    void* GetDisplay() const { return mDisplay; }
+    std::uintptr_t GetWindow() const { return mWindow; }
 
     // Each returns when the server has done it.
     void Resize(int width, int height);
@@ -26,9 +27,8 @@ public:
     unsigned long GetPixel(int x, int y) const;
 
 private:
-    struct Impl;
-    explicit XWindow(std::unique_ptr<Impl> impl);
-    std::unique_ptr<Impl> const mImpl;
+    _XDisplay* const mDisplay;
+    unsigned long mWindow = 0;
 };
 
 } // namespace Moka::Testing

@@ -59,23 +59,15 @@ void LeaveAMess(GLuint texture, GLuint sampler) {
 
 class PenCanvasPixel : public RenderThreadFixture, public ::testing::WithParamInterface<bool> {
 protected:
-    void SetUp() override {
-        RenderThreadFixture::SetUp();
+    PenCanvasPixel() {
         thread->Call([this] {
             RendererFactory::SetDeferred(GetParam());
             ink = Tool::GlInk::Create();
             glGenTextures(1, &texture);
             glGenSamplers(1, &sampler);
         });
-        bitmap = Create(expected);
-        pen = NewPenCanvas(*thread, bitmap);
-        canvas = NewCanvas(*thread, bitmap);
     }
-
-    void TearDown() override {
-        pen = {};
-        canvas = {};
-        bitmap = {};
+    ~PenCanvasPixel() override {
         thread->Call([this] {
             RendererFactory::Flush();
             glDeleteSamplers(1, &sampler);
@@ -84,7 +76,6 @@ protected:
             EXPECT_EQ(glGetError(), static_cast<GLenum>(GL_NO_ERROR));
             RendererFactory::InvalidateState();
         });
-        RenderThreadFixture::TearDown();
     }
 
     // What the pen engine does on the render thread, behind what was asked for before.
@@ -126,10 +117,10 @@ protected:
     std::unique_ptr<Tool::GlInk> ink; // render thread, like the names
     GLuint texture = 0;
     GLuint sampler = 0;
-    BitmapPtr bitmap;
-    RefPtr<IMKPenCanvas> pen;
-    RefPtr<IMKCanvas> canvas;
     Picture expected = MakeChecker(kWidth, kHeight, kWidth + kHeight, kPaper, kPaper);
+    BitmapPtr bitmap = Create(expected);
+    RefPtr<IMKPenCanvas> pen = NewPenCanvas(*thread, bitmap);
+    RefPtr<IMKCanvas> canvas = NewCanvas(*thread, bitmap);
 };
 
 // Its three panels: whole, cut by two clips, and turned under a clip that replaced another.

@@ -25,8 +25,6 @@ TEST_F(ContextTest, CapabilitiesAreTheDriversAndAskedForAnywhere) {
         EXPECT_EQ(caps->GetMaxTextureSize(), largest);
         EXPECT_EQ(caps->GetRenderer(), renderer);
         EXPECT_TRUE(RendererFactory::IsGPUNameEqualTo(renderer.c_str()));
-        EXPECT_FALSE(RendererFactory::IsGPUNameEqualTo((renderer + " ").c_str()));
-        EXPECT_FALSE(RendererFactory::IsGPUNameEqualTo(""));
         EXPECT_FALSE(RendererFactory::IsGPUNameEqualTo(nullptr));
     }).join();
     EXPECT_STREQ(caps->GetVendor(), reinterpret_cast<char const*>(glGetString(GL_VENDOR)));

@@ -82,9 +82,6 @@ protected:
     }
     Picture Read() { return RendererFixture::Read(*target, kSize, kSize); }
     static Picture Filled(Color color) { return MakeImage(kSize, kSize, color); }
-    static Picture With(Picture image, Color color, int x, int y, int w, int h) {
-        return image.With(x, y, MakeImage(w, h, color));
-    }
     static bool IsDeferred() { return GetParam(); }
 
     TexturePtr texture = MakeTexture(kSize, kSize);

@@ -81,10 +81,6 @@ constexpr Texts kPrograms[] = {
      "void main() { at[0] = alpha; at[1] = alpha.yx; gl_Position = vec4(zulu, 0.0, 1.0); }",
      "precision mediump float; uniform float number; varying vec2 at[2];"
      "void main() { gl_FragColor = vec4(at[0] * number, at[1].x, 1.0); }"},
-    {"gl_VertexID",
-     "#version 300 es\nin vec2 corner; void main() { gl_Position = vec4(corner, float(gl_VertexID) * 0.0, "
-     "1); }",
-     "#version 300 es\nuniform highp vec4 color; out highp vec4 c; void main() { c = color; }", false},
     {"a name that GLSL ES 3.00 reserves", MOKA_PLAIN,
      "precision highp float; uniform vec4 color; void main() { vec4 centroid = color; gl_FragColor = "
      "centroid; }",

@@ -46,7 +46,12 @@ protected:
     Color Draw() {
         Clear(*mImage.target, kClear);
         RendererFactory::Commit();
-        DrawRawStrip({{2, {-1, -1, 1, -1, -1, 1, 1, 1}}});
+        GLfloat const corners[] = {-1, -1, 1, -1, -1, 1, 1, 1};
+        glBindBuffer(GL_ARRAY_BUFFER, 0);
+        glEnableVertexAttribArray(0);
+        glVertexAttribPointer(0, 2, GL_FLOAT, GL_FALSE, 0, corners);
+        glDrawArrays(GL_TRIANGLE_STRIP, 0, 4);
+        glDisableVertexAttribArray(0);
         RendererFactory::InvalidateState();
         Picture const image = Read(*mImage.target, 2, 2);
         EXPECT_EQ(image, MakeImage(2, 2, image.GetColor(0, 0)));
@@ -59,14 +64,18 @@ protected:
 TEST_F(ProgramTest, AttributesTakeTheirLocationsInTheOrderOfTheText) {
     ProgramPtr const program =
         MakeProgram("attribute vec2 zulu; // attribute float none;\n"
-                    "attribute mat3 matrix; attribute highp float mike, alpha;"
-                    "void main() { gl_Position = vec4(zulu, mike, alpha) + matrix[2].xyzx; }",
+                    "#define NONE attribute vec4 none;\n"
+                    "/*/ attribute vec4 gone; /*/ attribute/**/mat3 matrix;\n"
+                    "float f(const in float other) { vec4 attribute_ = vec4(other); return attribute_.x; }\n"
+                    "attribute highp mat2 large; attribute highp float mike,alpha\n;"
+                    "void main() { gl_Position = vec4(zulu + large[1], mike, f(alpha)) + matrix[2].xyzx; }",
                     "void main() { gl_FragColor = vec4(1.0); }");
     GLuint const name = MakeCurrent(program);
     EXPECT_EQ(glGetAttribLocation(name, "zulu"), 0);
     EXPECT_EQ(glGetAttribLocation(name, "matrix"), 1);
-    EXPECT_EQ(glGetAttribLocation(name, "mike"), 4);
-    EXPECT_EQ(glGetAttribLocation(name, "alpha"), 5);
+    EXPECT_EQ(glGetAttribLocation(name, "large"), 4);
+    EXPECT_EQ(glGetAttribLocation(name, "mike"), 6);
+    EXPECT_EQ(glGetAttribLocation(name, "alpha"), 7);
 }
 
 // What arrives is seen in the scenes, which use every type but one.
@@ -132,7 +141,7 @@ TEST_F(ProgramTest, SourcesThatDoNotCompileOrLinkMakeAProgramThatDrawsNothing) {
          "link"},
         {"", kUniformColor, ""},
         {nullptr, nullptr, ""},
-        {"uniform vec4 misspelt;", "{", ""},
+        {"/* never closed; uniform vec4 misspelt;", "{", ""},
     };
     for (auto const& [vertex, fragment, stage] : cases) {
         std::uint64_t const errors = Count().errors;

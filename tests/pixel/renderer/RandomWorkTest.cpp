@@ -16,6 +16,9 @@ constexpr std::size_t kNone = kImages;
 constexpr int kWidths[kImages] = {kSize, kSize, 6};
 constexpr int kHeights[kImages] = {kSize, kSize, 11};
 constexpr GLenum kObstacles[] = {GL_CULL_FACE, GL_DEPTH_TEST, GL_RASTERIZER_DISCARD};
+constexpr GLenum kTransfers[] = {GL_UNPACK_ROW_LENGTH, GL_UNPACK_SKIP_ROWS, GL_UNPACK_SKIP_PIXELS,
+                                 GL_PACK_ROW_LENGTH,   GL_PACK_SKIP_ROWS,   GL_PACK_SKIP_PIXELS};
+constexpr GLint kHostsTransfer = 5;
 constexpr Color kColors[] = {kClear, kRed, kGreen, kBlue, {255, 255, 255, 255}};
 
 struct Box {
@@ -207,6 +210,11 @@ private:
         glBindBuffer(GL_UNIFORM_BUFFER, mHostsBuffer);
         glActiveTexture(GL_TEXTURE1);
         glBindTexture(GL_TEXTURE_2D, kLastName);
+        for (GLenum const transfer : kTransfers) glPixelStorei(transfer, kHostsTransfer);
+        glPixelStorei(GL_UNPACK_ALIGNMENT, 1);
+        glPixelStorei(GL_PACK_ALIGNMENT, 8);
+        glBindBuffer(GL_PIXEL_UNPACK_BUFFER, mHostsBuffer);
+        glBindBuffer(GL_PIXEL_PACK_BUFFER, mHostsBuffer);
         mHostsState = ReadHostsState();
     }
     static std::vector<GLint> ReadHostsState() {
@@ -222,6 +230,8 @@ private:
     void ExpectHostsState() const {
         if (mHostsState.empty()) return;
         EXPECT_EQ(ReadHostsState(), mHostsState);
+        // Not restored, but back at the default once it was changed.
+        for (GLenum const transfer : kTransfers) EXPECT_EQ(GetInteger(transfer) % kHostsTransfer, 0);
         for (int const unit : {GL_TEXTURE2, GL_TEXTURE1}) {
             glActiveTexture(static_cast<GLenum>(unit));
             EXPECT_EQ(GetInteger(GL_SAMPLER_BINDING), 0);

@@ -11,15 +11,9 @@ Function* FindDrivers(Function*, char const* name) {
     return reinterpret_cast<Function*>(dlsym(RTLD_NEXT, name));
 }
 
-int finishes = 0;
+int textureCopies = 0;
 
 } // namespace
-
-extern "C" [[gnu::visibility("default")]] void glFinish() {
-    static auto* const finish = FindDrivers(&glFinish, "glFinish");
-    ++finishes;
-    finish();
-}
 
 // New memory may hold anything, which llvmpipe's never does.
 extern "C" [[gnu::visibility("default")]] void glTexImage2D(GLenum target, GLint level, GLint internalFormat,
@@ -30,34 +24,18 @@ extern "C" [[gnu::visibility("default")]] void glTexImage2D(GLenum target, GLint
     make(target, level, internalFormat, width, height, border, format, type, pixels ? pixels : dirt.data());
 }
 
-// OpenGL ES makes an error of a copy that has to invent alpha, which Mesa tolerates.
 extern "C" [[gnu::visibility("default")]] void glCopyTexSubImage2D(GLenum target, GLint level, GLint toX,
                                                                    GLint toY, GLint x, GLint y, GLsizei width,
                                                                    GLsizei height) {
-    GLint alphaBits = 8;
-    if (Moka::Testing::GetInteger(GL_READ_FRAMEBUFFER_BINDING) != 0) {
-        glGetFramebufferAttachmentParameteriv(GL_READ_FRAMEBUFFER, GL_COLOR_ATTACHMENT0,
-                                              GL_FRAMEBUFFER_ATTACHMENT_ALPHA_SIZE, &alphaBits);
-    }
-    EXPECT_GT(alphaBits, 0) << "a texture copy out of a frame buffer without alpha";
     static auto* const copy = FindDrivers(&glCopyTexSubImage2D, "glCopyTexSubImage2D");
+    ++textureCopies;
     copy(target, level, toX, toY, x, y, width, height);
 }
 
 namespace Moka::Testing {
 namespace {
 
-class RenderTargetTest : public RendererFixture {
-protected:
-    static GLint GetAttachment(OffscreenImage const& image) {
-        image.target->Activate();
-        GLint name = 0;
-        glGetFramebufferAttachmentParameteriv(GL_DRAW_FRAMEBUFFER, GL_STENCIL_ATTACHMENT,
-                                              GL_FRAMEBUFFER_ATTACHMENT_OBJECT_NAME, &name);
-        image.target->Deactivate(false, false);
-        return name;
-    }
-};
+using RenderTargetTest = RendererFixture;
 
 TEST_F(RenderTargetTest, TheHostsFrameBufferIsCapturedAndNeverDeleted) {
     HostFrameBuffer const host(4, 4);
@@ -102,11 +80,6 @@ TEST_F(RenderTargetTest, DiscardingNamesThePartsByTheKindOfTheFrameBuffer) {
             EXPECT_EQ(GetInteger(GL_DRAW_FRAMEBUFFER_BINDING), 0);
         }
     }
-    // Only the depth and stencil were dropped the last but one time.
-    Clear(*target, kBlue);
-    target->Activate();
-    target->Deactivate(false, true);
-    EXPECT_EQ(Read(*texture), MakeImage(4, 4, kBlue));
 }
 
 TEST_F(RenderTargetTest, ADriverErrorIsLoggedCountedAndHarmless) {
@@ -124,6 +97,7 @@ TEST_F(RenderTargetTest, ADriverErrorIsLoggedCountedAndHarmless) {
     glDeleteFramebuffers(1, &incomplete);
 }
 
+// By a blit: OpenGL ES makes an error of a texture copy that has to invent alpha, which Mesa tolerates.
 TEST_F(RenderTargetTest, ATargetWithoutAlphaIsCopiedWithAlphaOne) {
     HostFrameBuffer const host(5, 4, GL_RGB8, Color{10, 20, 30, 40});
     TargetPtr const target(RendererFactory::CreateRenderTargetFromCurrent(5, 4));
@@ -132,43 +106,28 @@ TEST_F(RenderTargetTest, ATargetWithoutAlphaIsCopiedWithAlphaOne) {
     RendererFactory::InvalidateState();
     TexturePtr const copy = MakeTexture(MakeImage(6, 6, kGreen));
     target->Activate();
+    int const before = textureCopies;
     copy->CopyFromRenderTarget();
     target->Deactivate(false, false);
+    EXPECT_EQ(textureCopies, before);
     EXPECT_TRUE(glIsEnabled(GL_SCISSOR_TEST));
     Picture const solid = MakeImage(5, 4, Color{10, 20, 30, 255});
     EXPECT_EQ(Read(*copy), MakeImage(6, 6, kGreen).With(0, 0, solid));
 }
 
-TEST_F(RenderTargetTest, ACopyWaitsForWhatWasDrawnWhereTheDriverDoesNot) {
-    std::string const renderer = reinterpret_cast<char const*>(glGetString(GL_RENDERER));
-    int const waits = renderer.rfind("llvmpipe", 0) == 0 ? 1 : 0;
-    OffscreenImage const image = MakeOffscreen(MakeImage(4, 4, kRed));
-    OffscreenImage const other = MakeOffscreen(MakeImage(4, 4));
-    for (bool const isBlit : {false, true}) {
-        Clear(*image.target, kBlue);
-        (isBlit ? other : image).target->Activate();
-        int const before = finishes;
-        isBlit ? image.texture->DrawToCurrent() : other.texture->CopyFromRenderTarget();
-        RendererFactory::Flush();
-        EXPECT_EQ(finishes - before, waits) << isBlit;
-        EXPECT_EQ(Read(*other.texture), MakeImage(4, 4, kBlue));
-    }
-}
-
 TEST_F(RenderTargetTest, WhatDoesNotFitIsRefusedWithALine) {
     OffscreenImage const image = MakeOffscreen(MakeImage(4, 4));
     HostFrameBuffer const host(4, 4);
-    OffscreenImage const hosts{nullptr, TargetPtr(RendererFactory::CreateRenderTargetFromCurrent(4, 4))};
+    TargetPtr const hosts(RendererFactory::CreateRenderTargetFromCurrent(4, 4));
     GLint const bound = GetInteger(GL_RENDERBUFFER_BINDING);
     EXPECT_NE(bound, 0);
     DepthStencilPtr const small = MakeDepthStencil(4, 3);
     DepthStencilPtr const fitting = MakeDepthStencil(4, 4);
     EXPECT_EQ(GetInteger(GL_RENDERBUFFER_BINDING), bound); // the host's, still
     image.target->AttachDepthStencil(small.get());
-    EXPECT_EQ(GetAttachment(image), 0);
-    hosts.target->AttachDepthStencil(fitting.get());
-    EXPECT_EQ(GetAttachment(hosts), 0);
-    hosts.target->ClearDepthStencil(true, 1, true, 1);
+    hosts->AttachDepthStencil(fitting.get());
+    for (IRenderTarget* const each : {image.target.get(), hosts.get()})
+        each->ClearDepthStencil(true, 1, true, 1);
     EXPECT_EQ(Count().clears, 0u);
     EXPECT_FALSE(RendererFactory::CreateDepthStencilBuffer(0, 4));
     EXPECT_EQ(TakeErrors().size(), 3u);

@@ -130,18 +130,6 @@ void RendererFixture::StartEgl() {
     ASSERT_TRUE(mEgl) << error;
 }
 
-void DrawRawStrip(std::initializer_list<RawAttribute> attributes) {
-    glBindBuffer(GL_ARRAY_BUFFER, 0);
-    GLuint location = 0;
-    for (RawAttribute const& attribute : attributes) {
-        glEnableVertexAttribArray(location);
-        glVertexAttribPointer(location++, attribute.components, GL_FLOAT, GL_FALSE, 0,
-                              attribute.values.data());
-    }
-    glDrawArrays(GL_TRIANGLE_STRIP, 0, 4);
-    while (location > 0) glDisableVertexAttribArray(--location);
-}
-
 GLint GetInteger(GLenum name) {
     GLint value = 0;
     glGetIntegerv(name, &value);

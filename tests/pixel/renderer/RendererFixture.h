@@ -109,15 +109,6 @@ private:
     std::uint64_t mKnownDriverErrors = 0;
 };
 
-struct RawAttribute {
-    int components;
-    std::vector<GLfloat> values; // of the four vertices, one after the other
-};
-
-// A triangle strip of four vertices with whatever program is current, with raw GL, from the test's own
-// memory; the n-th attribute feeds location n.
-void DrawRawStrip(std::initializer_list<RawAttribute> attributes);
-
 GLint GetInteger(GLenum name);
 
 // For tests with deferral and without.

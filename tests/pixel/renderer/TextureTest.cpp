@@ -1,5 +1,4 @@
-// Textures: labels, what is refused, and the driver's transfer state. Uploads, copies and lifetimes are in
-// RandomWorkTest, sampling is in the scenes.
+// Textures: labels, and what is refused. Uploads, copies and lifetimes are in RandomWorkTest, sampling is in the scenes.
 #include "tests/pixel/renderer/RendererFixture.h"
 
 #include "moka/base/Rect.h"
@@ -17,11 +16,8 @@ using TextureTest = RendererFixture;
 TEST_F(TextureTest, LabelsAreCopiedAtOnceAndReachTheDriver) {
     TexturePtr const texture = MakeTexture(2, 2);
     EXPECT_STREQ(texture->GetLabel(), "");
-    std::string label = "strip 3";
-    texture->SetLabel(label.c_str());
-    label.assign("changed");
+    texture->SetLabel(std::string("strip 3").c_str());
     EXPECT_STREQ(texture->GetLabel(), "strip 3");
-
     auto const getLabel =
         reinterpret_cast<PFNGLGETOBJECTLABELKHRPROC>(eglGetProcAddress("glGetObjectLabelKHR"));
     texture->Bind(2);
@@ -102,36 +98,6 @@ TEST_F(TextureTest, ANewTextureIsTransparentWhateverTheHostsScissorAndMask) {
     GLboolean mask[4];
     glGetBooleanv(GL_COLOR_WRITEMASK, mask);
     EXPECT_EQ(mask[0] + 2 * mask[1] + 4 * mask[2] + 8 * mask[3], 10);
-}
-
-TEST_F(TextureTest, TheHostsTransferStateDisturbsNothingAndIsBackAtItsDefaults) {
-    constexpr GLenum kNames[] = {GL_UNPACK_ROW_LENGTH, GL_UNPACK_SKIP_ROWS, GL_UNPACK_SKIP_PIXELS,
-                                 GL_PACK_ROW_LENGTH,   GL_PACK_SKIP_ROWS,   GL_PACK_SKIP_PIXELS};
-    GLuint buffer = 0;
-    glGenBuffers(1, &buffer);
-    glBindBuffer(GL_PIXEL_UNPACK_BUFFER, buffer);
-    glBufferData(GL_PIXEL_UNPACK_BUFFER, 4096, nullptr, GL_STREAM_DRAW);
-    auto const disturb = [&] {
-        for (GLenum const name : kNames) glPixelStorei(name, 3);
-        glPixelStorei(GL_UNPACK_ALIGNMENT, 1);
-        glPixelStorei(GL_PACK_ALIGNMENT, 8);
-        glBindBuffer(GL_PIXEL_UNPACK_BUFFER, buffer);
-        glBindBuffer(GL_PIXEL_PACK_BUFFER, buffer);
-    };
-    disturb();
-    Picture const image = MakePattern(9, 7);
-    TexturePtr const texture = MakeTexture(image);
-    disturb();
-    texture->Replace(Rect(1, 1, 4, 3), MakeImage(3, 2, kRed).pixels.data(), 0);
-    disturb();
-    Picture const all = Read(*texture);
-    EXPECT_EQ(all, image.With(1, 1, MakeImage(3, 2, kRed)));
-    // Only the direction that was used is put back.
-    texture->Replace(all.pixels.data(), 0);
-    for (GLenum const name : kNames) EXPECT_EQ(GetInteger(name), 0) << std::hex << name;
-    EXPECT_EQ(GetInteger(GL_PIXEL_UNPACK_BUFFER_BINDING) + GetInteger(GL_PIXEL_PACK_BUFFER_BINDING), 0);
-    EXPECT_EQ(GetInteger(GL_UNPACK_ALIGNMENT) + GetInteger(GL_PACK_ALIGNMENT), 8);
-    glDeleteBuffers(1, &buffer);
 }
 
 } // namespace

@@ -14,6 +14,11 @@ RectF WholeOf(IMKBitmap const& bitmap) {
             static_cast<float>(bitmap.GetWidth()), static_cast<float>(bitmap.GetHeight())};
 }
 
+RectF PlaceAt(IMKBitmap const& bitmap, PointF const& p) {
+    return {p.x, p.y, p.x + static_cast<float>(bitmap.GetWidth()),
+            p.y + static_cast<float>(bitmap.GetHeight())};
+}
+
 void SetTiling(Wrap& wrap, int mode) {
     if (mode == MKPaint::Default || mode == MKPaint::Clamp) wrap = Wrap::Clamp;
     if (mode == MKPaint::Mirror) wrap = Wrap::Mirror;
@@ -74,10 +79,7 @@ Brush MakeBrush(Picture const& image, Sampler const& sampler, BitmapQuad const& 
 } // namespace
 
 void ReferenceCanvas::DrawBitmap(IMKBitmap* bitmap, float x, float y, MKPaint const* paint) {
-    if (!bitmap) return;
-    auto const width = static_cast<float>(bitmap->GetWidth());
-    auto const height = static_cast<float>(bitmap->GetHeight());
-    DrawBitmap(bitmap, RectF(x, y, x + width, y + height), paint);
+    if (bitmap) DrawBitmap(bitmap, PlaceAt(*bitmap, {x, y}), paint);
 }
 
 void ReferenceCanvas::DrawBitmap(IMKBitmap* bitmap, RectF const& dst, MKPaint const* paint) {
@@ -136,10 +138,8 @@ void ReferenceCanvas::DrawQuads(Picture const& image, ReferenceBitmap const& bit
 
 void ReferenceCanvas::DrawBitmaps(IMKBitmap* bitmap, std::vector<PointF>& points, MKPaint const* paint) {
     if (!bitmap) return;
-    auto const width = static_cast<float>(bitmap->GetWidth());
-    auto const height = static_cast<float>(bitmap->GetHeight());
     std::vector<RectF> dsts;
-    for (PointF const& p : points) dsts.emplace_back(p.x, p.y, p.x + width, p.y + height);
+    for (PointF const& p : points) dsts.push_back(PlaceAt(*bitmap, p));
     DrawBitmaps(bitmap, dsts, paint);
 }
 

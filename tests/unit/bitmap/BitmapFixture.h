@@ -9,8 +9,7 @@
 #include "moka/graphics/factory/MKGraphicsFactory.h"
 #include "moka/renderer/ITextureObject.h"
 #include "moka/renderer/RendererFactory.h"
-#include "tests/support/Queues.h"
-#include "tests/support/RendererTrace.h"
+#include "tests/support/PumpedRenderer.h"
 #include "tests/support/TestImages.h"
 
 #include <cstring>
@@ -57,26 +56,11 @@ class BitmapFixture : public ::testing::Test {
 protected:
     static constexpr int kMaxSide = 64;
 
-    void SetUp() override {
-        RendererTrace::Reset();
-        RendererTrace::SetMaxTextureSize(kMaxSide);
-        ASSERT_TRUE(RendererFactory::AttachContext());
-        mAliveBefore = RendererTrace::CountLiveObjects(); // other tests leak on purpose
-        RendererTrace::DeclareNoRenderThread();
-        RunOnRenderThread(queue);
-    }
-
-    void TearDown() override {
+    // When the members of the fixtures that derive from it are gone.
+    ~BitmapFixture() override {
         queue.RunAll();
         EXPECT_EQ(RendererTrace::CountLiveObjects(), mAliveBefore);
         for (std::string const& violation : RendererTrace::GetViolations()) ADD_FAILURE() << violation;
-        RendererTrace::DeclareRenderThread();
-        RendererFactory::DetachContext();
-    }
-
-    static void RunOnRenderThread(HandPumpedQueue& any) {
-        any.SetAroundRun([] { RendererTrace::DeclareRenderThread(); },
-                         [] { RendererTrace::DeclareNoRenderThread(); });
     }
 
     IMKBitmap* Create(int width, int height, void const* pixels = nullptr) {
@@ -109,10 +93,10 @@ protected:
     }
 
     bool refuse = false; // what the queue does with the next tasks
-    RefusingQueue queue{RefusingQueue::Predicate([this](int, ITask*) { return refuse; })};
+    PumpedRenderer queue{kMaxSide, [this] { return refuse; }};
 
 private:
-    int mAliveBefore = 0;
+    int const mAliveBefore = RendererTrace::CountLiveObjects(); // other tests leak on purpose
 };
 
 } // namespace Moka::Testing

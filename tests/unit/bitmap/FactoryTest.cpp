@@ -3,6 +3,7 @@
 #include "moka/graphics/bitmap/ImageDecoding.h"
 #include "moka/graphics/canvas/IMKCanvas.h"
 #include "moka/graphics/canvas/IMKPenCanvas.h"
+#include "moka/graphics/factory/BitmapsAndCanvases.h"
 #include "tests/unit/bitmap/FactoryFixture.h"
 
 #include <string>
@@ -94,6 +95,27 @@ TEST_F(Factory, ARegionOfAFileIsDecodedWhateverItsExtensionAndOwnsItsPixelsUntil
     }
     EXPECT_EQ(MKGraphicsFactory::CreateBitmap(&queue, Rect(9, 0, 12, 3), &png, 1), nullptr);
     EXPECT_EQ(MKGraphicsFactory::CreateBitmap(nullptr, Rect(0, 0, 1, 1), &png, 1), nullptr);
+}
+
+TEST_F(Factory, ASavedBitmapIsLoadedWithEveryPixelAndWhatFailsSaysWhyAndKeepsTheFile) {
+    std::string const path = folder.Path("picture.mki");
+    Picture const image = MakeAlphaPattern(20, 2 * kMaxSide + 1);
+    auto const bitmap = NewBitmap(image.width, image.height, image.pixels.data());
+    std::string reason;
+    ASSERT_TRUE(SaveBitmap(*bitmap, path, 100, &reason)) << reason;
+    EXPECT_EQ(ReadAll(LoadBitmap(queue, path)), image.pixels);
+
+    EXPECT_FALSE(SaveBitmap(*bitmap, folder.Path("picture.bmp"), 100, &reason));
+    EXPECT_NE(reason.find("unknown extension 'bmp'"), std::string::npos) << reason;
+    EXPECT_FALSE(LoadBitmap(queue, folder.Path("missing.png"), &reason));
+    EXPECT_NE(reason.find("No such file"), std::string::npos) << reason;
+    auto const unread = NewBitmap(4, 4);
+    refuse = true; // as a queue that was stopped does
+    EXPECT_FALSE(SaveBitmap(*unread, path, 100, &reason));
+    EXPECT_NE(reason.find("refuses"), std::string::npos) << reason;
+    refuse = false;
+    for (int read = 0; read < 2; ++read) StripOf(unread)->Unref(); // the references of the refused tasks
+    EXPECT_EQ(ReadAll(LoadBitmap(queue, path)), image.pixels);
 }
 
 } // namespace

@@ -9,20 +9,14 @@ namespace {
 
 using TextureBitmap = BitmapFixture;
 
-std::vector<Rect> RectsOf(BitmapPtr const& bitmap) {
-    std::vector<Rect> rects;
-    IMKTextureBitmap* const strips = bitmap->GetTextureBitmap();
-    for (int i = 0; i < strips->GetSubBitmapCount(); ++i)
-        rects.push_back(strips->GetSubBitmap(i)->GetBitmapRect());
-    return rects;
-}
-
 TEST_F(TextureBitmap, ARegionGetsStripsOnlyWhereItIsAndTheyKeepTheirNumbers) {
     int const h = 3 * kMaxSide;
     Pixels const pixels = UniquePixels(10, h);
     auto const bitmap = BitmapPtr::Adopt(
         MKGraphicsFactory::CreateBitmap(&queue, Rect(2, 70, 99, 140), 10, h, pixels.data(), 1));
-    ASSERT_EQ(RectsOf(bitmap), (std::vector<Rect>{Rect(2, 70, 10, 128), Rect(2, 128, 10, 140)}));
+    ASSERT_EQ(bitmap->GetTextureBitmap()->GetSubBitmapCount(), 2);
+    EXPECT_EQ(StripOf(bitmap)->GetBitmapRect(), Rect(2, 70, 10, 128));
+    EXPECT_EQ(StripOf(bitmap, 1)->GetBitmapRect(), Rect(2, 128, 10, 140));
     EXPECT_EQ(StripOf(bitmap)->GetBitmapIndex(), 1);
     EXPECT_EQ(StripOf(bitmap, 1)->GetBitmapIndex(), 2);
     EXPECT_EQ(bitmap->GetBitmapRect(), Rect(0, 0, 10, h)) << "at its place in the whole";
@@ -97,6 +91,9 @@ TEST_F(TextureBitmap, ACloneMadeBeforeAnythingRanShowsTheImage) {
     EXPECT_EQ(CountOf(clone.Get()), 1);
     EXPECT_EQ(CountOf(parent.Get()), 2) << "the clone holds its parent";
     for (int i = 0; i < 3; ++i) EXPECT_EQ(CountOf(StripOf(parent, i)) + CountOf(StripOf(clone, i)), 2);
+    Pixels const other(pixels.size(), 7);
+    clone->GetTextureBitmap()->UpdateBitmap(other.data(), 0);
+    EXPECT_EQ(ReadAll(parent), other);
     clone->GetBitmapReadable()->SetTextureWrap(TextureWrapRepeat); // sampling is each one's own
     queue.RunAll();
     EXPECT_NE(RendererTrace::GetParameter(StripOf(parent)->GetTexture(), TextureParamWrappingS),

@@ -48,12 +48,6 @@ public:
 
 class CanvasFixture : public BitmapFixture {
 protected:
-    void TearDown() override {
-        canvas = {};
-        target = {};
-        BitmapFixture::TearDown();
-    }
-
     // The target and the canvas are these from now on, and everything so far has run and is forgotten.
     void Use(BitmapPtr const& bitmap) {
         target = bitmap;
@@ -110,9 +104,8 @@ protected:
     std::vector<std::string> TakeCalls(std::string const& operation) {
         queue.RunAll();
         std::vector<std::string> calls;
-        for (TracedCall const& call : RendererTrace::GetCalls())
-            if (call.operation == operation) calls.push_back(ToString(call));
-        RendererTrace::TakeCalls();
+        for (std::string const& call : RendererTrace::TakeCalls())
+            if (call.find(" " + operation) != std::string::npos) calls.push_back(call);
         return calls;
     }
 

@@ -23,10 +23,7 @@ class Clipping : public CanvasFixture {
 protected:
     static constexpr int kHeight = 60;
 
-    void SetUp() override {
-        CanvasFixture::SetUp();
-        Use(NewBitmap(50, kHeight));
-    }
+    Clipping() { Use(NewBitmap(50, kHeight)); }
     void Clip(int x, int y, int width, int height, IMKCanvasBase::ClipOp op = Intersect) {
         canvas->SetClipRect(x, y, width, height, op);
     }
@@ -163,38 +160,30 @@ TEST_F(Clipping, AClippedDrawLeavesTheScissorAsItWasAndAnUnclippedOneOff) {
 // Straight to the clipping, on the render thread.
 class ClipCounts : public Clipping {
 protected:
-    void SetUp() override {
-        Clipping::SetUp();
-        RendererTrace::DeclareRenderThread();
-        clipping = std::make_unique<MKCanvasClipping>(target.Get());
-    }
-    void TearDown() override {
-        clipping.reset();
-        RendererTrace::DeclareNoRenderThread();
-        Clipping::TearDown();
-    }
     PipelineState Enabled() {
-        clipping->EnableClipRT(0);
+        clipping.EnableClipRT(0);
         PipelineState const state = RendererTrace::GetState();
-        clipping->DisableClipRT();
+        clipping.DisableClipRT();
         return state;
     }
-    std::unique_ptr<MKCanvasClipping> clipping;
+
+    OnRenderThread const here;
+    MKCanvasClipping clipping{target.Get()};
 };
 
 TEST_F(ClipCounts, MoreThanThereAreAddsEmptyOnesAndFewerDropTheLast) {
-    clipping->AddClipRectRT({1, 2, 30, 30, Intersect, {}});
-    clipping->AddClipRectRT({5, 5, 5, 5, Intersect, {}});
-    clipping->RemoveClipRectRT(1);
+    clipping.AddClipRectRT({1, 2, 30, 30, Intersect, {}});
+    clipping.AddClipRectRT({5, 5, 5, 5, Intersect, {}});
+    clipping.RemoveClipRectRT(1);
     EXPECT_EQ(Enabled().scissor, (ScissorRect{1, 2, 30, 30}));
-    clipping->RemoveClipRectRT(3);
+    clipping.RemoveClipRectRT(3);
     EXPECT_EQ(Enabled().scissor, (ScissorRect{0, kHeight, 0, 0}));
     // An all-zero matrix hides its rectangle from the stencil too; the identity would show (0, 0).
-    clipping->AddClipRectRT({1, 1, 9, 9, Union, {}});
+    clipping.AddClipRectRT({1, 1, 9, 9, Union, {}});
     RendererTrace::TakeEvents();
     EXPECT_TRUE(Enabled().depthStencil.IsStencil());
     EXPECT_EQ(ProjectionOf(RendererTrace::GetDraws()[2])[0], 0.0f);
-    clipping->RemoveClipRectRT(0);
+    clipping.RemoveClipRectRT(0);
     EXPECT_FALSE(Enabled().scissorOn);
 }
 

@@ -15,10 +15,7 @@ using ::testing::SizeIs;
 class Drawing : public CanvasFixture {
 protected:
     // Two strips, the second one 36 rows high; frame buffers "target 1" and "target 2".
-    void SetUp() override {
-        CanvasFixture::SetUp();
-        Use(NewBitmap(60, kMaxSide + 36));
-    }
+    Drawing() { Use(NewBitmap(60, kMaxSide + 36)); }
 
     Numbers Mvp(int strip, Matrix3<float> const& m) {
         return NumbersOf(StripOf(target, strip)->GetProjectionMatrix() * FromMatrix3(m));

@@ -11,10 +11,7 @@ using ::testing::SizeIs;
 
 class FrontEnd : public CanvasFixture {
 protected:
-    void SetUp() override {
-        CanvasFixture::SetUp();
-        Use(NewBitmap(50, 50));
-    }
+    FrontEnd() { Use(NewBitmap(50, 50)); }
 };
 
 TEST_F(FrontEnd, ARequestHasTheMatrixOfItsTimeAndWithoutAPaintANewOne) {

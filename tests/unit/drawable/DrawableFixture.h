@@ -12,25 +12,7 @@
 
 #include <gmock/gmock.h>
 
-#include <cstddef>
-#include <limits>
-
 namespace Moka::Testing {
-
-constexpr float kNaN = std::numeric_limits<float>::quiet_NaN();
-constexpr float kInfinity = std::numeric_limits<float>::infinity();
-
-using Vertex = std::vector<float>;
-
-inline std::vector<Vertex> VerticesOf(TracedDraw const& draw) {
-    auto const size = static_cast<std::size_t>(draw.floatsPerVertex);
-    std::vector<Vertex> vertices;
-    for (std::size_t i = 0; i + size <= draw.vertices.size(); i += size) {
-        auto const first = draw.vertices.begin() + static_cast<std::ptrdiff_t>(i);
-        vertices.emplace_back(first, first + draw.floatsPerVertex);
-    }
-    return vertices;
-}
 
 // The values of uniforms, one after the other.
 inline std::string Values(TracedDraw const& draw, std::vector<std::string> const& uniforms) {
@@ -41,14 +23,6 @@ inline std::string Values(TracedDraw const& draw, std::vector<std::string> const
             (values.empty() ? "" : " | ") + (found == draw.uniforms.end() ? "unset" : found->second.text);
     }
     return values;
-}
-
-inline MKPaint CommonPaint() {
-    MKPaint paint;
-    paint.SetColor(0.5f, 0.25f, 0.125f, 0.75f);
-    paint.SetTintColor(1, 0, 0.5f, 0.25f);
-    paint.SetXFermode(MKPaint::DstIn);
-    return paint;
 }
 
 // A stencil test, as a clip leaves it, and no blending.
@@ -66,16 +40,15 @@ inline void ForceOtherStates() {
 // Shaders on the render thread. Every test ends with nothing alive that was not before, and nothing misused.
 class ShaderFixture : public ::testing::Test {
 protected:
-    void SetUp() override {
+    ShaderFixture() {
         RendererTrace::Reset();
-        ASSERT_TRUE(RendererFactory::AttachContext());
+        RendererFactory::AttachContext();
         expectedAlive = RendererTrace::CountLiveObjects();
     }
-
-    void TearDown() override {
+    // When the members of the fixtures that derive from it are gone.
+    ~ShaderFixture() override {
         EXPECT_EQ(RendererTrace::CountLiveObjects(), expectedAlive);
         EXPECT_THAT(RendererTrace::GetViolations(), ::testing::IsEmpty());
-        RendererFactory::DetachContext();
         RendererTrace::Reset();
     }
 
@@ -87,10 +60,7 @@ protected:
 class DrawableFixture : public ShaderFixture {
 protected:
     // Without a target, the state of an immediate renderer is the host's.
-    void SetUp() override {
-        ShaderFixture::SetUp();
-        RendererFactory::SetDeferred(true);
-    }
+    DrawableFixture() { RendererFactory::SetDeferred(true); }
 
     // Those since the last call.
     static std::vector<TracedDraw> TakeDraws() {
@@ -99,19 +69,7 @@ protected:
             if (auto const* draw = std::get_if<TracedDraw>(&event)) draws.push_back(*draw);
         return draws;
     }
-    static TracedDraw TakeDraw() {
-        std::vector<TracedDraw> const draws = TakeDraws();
-        EXPECT_EQ(draws.size(), 1u);
-        return draws.empty() ? TracedDraw() : draws.back();
-    }
 
-    // What CommonPaint and the projection must have become, whoever draws.
-    static void ExpectCommonState(TracedDraw const& draw) {
-        EXPECT_EQ(Values(draw, {"uProjectionMatrix", "uColor", "uTintColor", "uHasTintColor"}),
-                  "2 0 0 0 0 3 0 0 0 0 1 0 -1 0.5 0 1 | 0.5 0.25 0.125 0.75 | 1 0 0.5 0.25 | 1");
-        EXPECT_TRUE(draw.state.blend.IsBlending());
-        EXPECT_EQ(draw.state.blend.GetColorEquation().destination, BlendingFactor::SrcAlpha); // DstIn
-    }
     Matrix4<float> const projection{2, 0, 0, 0, 0, 3, 0, 0, 0, 0, 1, 0, -1, 0.5f, 0, 1};
 };
 

@@ -88,7 +88,7 @@ TEST_F(ProcessExit, InTheMiddleOfAFileWithMoreQueued) {
 TEST_F(ProcessExit, WithAReadBackThatTheQueueRefused) {
     ExpectCleanExit([] {
         static bool refuse = false;
-        static RefusingQueue queue(RefusingQueue::Predicate([](int, ITask*) { return refuse; }));
+        static HandPumpedQueue queue([] { return refuse; });
         RendererFactory::AttachContext();
         MKBitmapLoader::startEventLoopBySelf();
         static IMKBitmap* const bitmap =

@@ -30,10 +30,10 @@ protected:
         RendererTrace::Reset();
         RendererFactory::AttachContext();
         RendererFactory::SetDeferred(true);
+        program = MakeProgram();
         program->MakeCurrent();
         width.reset(program->GetParameter("width"));
-        texture.reset(RendererFactory::CreateTextureObject(
-            TextureDescriptor(kSize, kSize, 0, 2, 6, 1, false, nullptr), nullptr, 0, {}));
+        texture = MakeTexture();
         target.reset(RendererFactory::CreateOffscreenRenderTarget(texture.get()));
         graphics = MakeGraphics();
         target->Activate();
@@ -41,16 +41,20 @@ protected:
     }
     ~RecorderFixture() override { RendererTrace::Reset(); } // what is alive may be released later
 
+    static std::unique_ptr<ITextureObject> MakeTexture() {
+        TextureDescriptor const descriptor(kSize, kSize, 0, 2, 6, 1, false, nullptr);
+        return std::unique_ptr<ITextureObject>(
+            RendererFactory::CreateTextureObject(descriptor, nullptr, 0, {}));
+    }
     // Of vertices of one float.
-    static Released<IGraphicsObject> MakeGraphics() {
+    static Released<IGraphicsObject> MakeGraphics(PrimitiveType primitive = PrimitiveType::TriangleList) {
         VertexDescriptor layout;
         layout.addAttribute(VertexAttributeType::Float, 1, -1, 0);
-        return Released<IGraphicsObject>(
-            RendererFactory::CreateGraphicsObject(1, PrimitiveType::TriangleList, &layout, 0, 0));
+        return Released<IGraphicsObject>(RendererFactory::CreateGraphicsObject(1, primitive, &layout, 0, 0));
     }
     static Released<IShaderProgram> MakeProgram() {
         return Released<IShaderProgram>(
-            RendererFactory::CreateShaderProgram("", "uniform float width;", "Sample"));
+            RendererFactory::CreateShaderProgram("", "uniform float width; uniform int count;", "Sample"));
     }
     void SetVertices(std::initializer_list<float> vertices) const {
         graphics->SetVertices(0, std::data(vertices), static_cast<int>(vertices.size()));
@@ -59,7 +63,7 @@ protected:
     static RendererStatistics Count() { return RendererFactory::GetStatistics(); }
 
     Released<IGraphicsObject> graphics;
-    Released<IShaderProgram> program = MakeProgram();
+    Released<IShaderProgram> program;
     std::unique_ptr<IParameterBinding> width;
     std::unique_ptr<ITextureObject> texture;
     Released<IRenderTarget> target;

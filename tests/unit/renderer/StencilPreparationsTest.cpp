@@ -94,8 +94,7 @@ protected:
         }
     }
 
-    std::unique_ptr<ITextureObject> otherTexture{RendererFactory::CreateTextureObject(
-        TextureDescriptor(kSize, kSize, 0, 2, 6, 1, false, nullptr), nullptr, 0, {})};
+    std::unique_ptr<ITextureObject> otherTexture = MakeTexture();
     Released<IRenderTarget> otherTarget{RendererFactory::CreateOffscreenRenderTarget(otherTexture.get())};
     Released<IDepthStencilBuffer> buffer{RendererFactory::CreateDepthStencilBuffer(kSize, kSize)};
     IRenderTarget* active = nullptr;
