@@ -162,6 +162,7 @@ TEST_F(HandlerTest, DestructionElsewhereWaitsForTheRunningMessage) {
         loop.Run();
     });
     running.Await([](MessageLoop* loop) { return loop != nullptr; });
+    std::this_thread::sleep_for(std::chrono::milliseconds(20)); // until the loop waits for a message
     (*receiver)->SendMessage(0);
     entered.AwaitAtLeast(true);
     receiver->DestroyHandler();
