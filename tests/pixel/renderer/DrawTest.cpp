@@ -100,7 +100,7 @@ TEST_P(DrawTest, AFullListIsSubmittedAndASecondFrameNeitherQueriesNorGrowsAnythi
 }
 
 // The copy of the target flushes the list that the vertices fill.
-TEST_P(DrawTest, AnImageIsDrawnOntoItselfWithMoreVerticesThanAListHolds) {
+TEST_P(DrawTest, AnImageIsDrawnOntoItselfWithMoreVerticesThanAListHoldsAndOtherGlEndsItsBlending) {
     BlendStateDescriptor add(true);
     add.SetColorEquation(BlendingFunction::Add, BlendingFactor::One, BlendingFactor::One);
     blend->SetDescriptor(add);
@@ -116,7 +116,12 @@ TEST_P(DrawTest, AnImageIsDrawnOntoItselfWithMoreVerticesThanAListHolds) {
     quad->SetVertices(0, corners.data(), 150000);
     EXPECT_TRUE(quad->Draw(0, -1, 1));
     Fill(kGreen, 0, 0, 2, 2);
-    EXPECT_EQ(Read(), Filled({200, 0, 0, 255}).With(0, 0, MakeImage(2, 2, {200, 255, 0, 255})));
+    RendererFactory::InvalidateState();
+    Fill(kGreen, 4, 4, 6, 6);
+    EXPECT_EQ(Read(), Filled({200, 0, 0, 255})
+                          .With(0, 0, MakeImage(2, 2, {200, 255, 0, 255}))
+                          .With(4, 4, MakeImage(2, 2, kGreen)))
+        << "the blend state is to be applied again after other GL";
     target->Deactivate(false, false);
     RendererFactory::Flush(); // takes the copy away
 }
