@@ -30,9 +30,9 @@ protected:
         return Count().runs - std::exchange(mRuns, Count().runs);
     }
 
-    Released<IGraphicsObject> strip = MakeGraphics(PrimitiveType::TriangleStrip);
+    RendererPtr<IGraphicsObject> strip = MakeGraphics(PrimitiveType::TriangleStrip);
     std::unique_ptr<ITextureObject> otherTexture = MakeTexture();
-    Released<IRenderTarget> otherTarget{RendererFactory::CreateOffscreenRenderTarget(otherTexture.get())};
+    RendererPtr<IRenderTarget> otherTarget{RendererFactory::CreateOffscreenRenderTarget(otherTexture.get())};
 
 private:
     std::uint64_t mRuns = 0;

@@ -1,6 +1,7 @@
 // RecorderFixture: the deferring renderer over a device without a driver, with a program and an active target.
 #pragma once
 
+#include "moka/graphics/drawable/RendererPtr.h"
 #include "moka/renderer/IParameterBinding.h"
 #include "moka/renderer/IRenderTarget.h"
 #include "moka/renderer/IShaderProgram.h"
@@ -13,14 +14,7 @@
 
 namespace Moka::Testing {
 
-struct ReleaseIt {
-    template <class T>
-    void operator()(T* object) const {
-        object->Release();
-    }
-};
-template <class T>
-using Released = std::unique_ptr<T, ReleaseIt>;
+using detail::RendererPtr;
 
 class RecorderFixture : public ::testing::Test {
 protected:
@@ -47,13 +41,14 @@ protected:
             RendererFactory::CreateTextureObject(descriptor, nullptr, 0, {}));
     }
     // Of vertices of one float.
-    static Released<IGraphicsObject> MakeGraphics(PrimitiveType primitive = PrimitiveType::TriangleList) {
+    static RendererPtr<IGraphicsObject> MakeGraphics(PrimitiveType primitive = PrimitiveType::TriangleList) {
         VertexDescriptor layout;
         layout.addAttribute(VertexAttributeType::Float, 1, -1, 0);
-        return Released<IGraphicsObject>(RendererFactory::CreateGraphicsObject(1, primitive, &layout, 0, 0));
+        return RendererPtr<IGraphicsObject>(
+            RendererFactory::CreateGraphicsObject(1, primitive, &layout, 0, 0));
     }
-    static Released<IShaderProgram> MakeProgram() {
-        return Released<IShaderProgram>(
+    static RendererPtr<IShaderProgram> MakeProgram() {
+        return RendererPtr<IShaderProgram>(
             RendererFactory::CreateShaderProgram("", "uniform float width; uniform int count;", "Sample"));
     }
     void SetVertices(std::initializer_list<float> vertices) const {
@@ -62,11 +57,11 @@ protected:
     void SetWidth(float value) const { width->Set(&value); }
     static RendererStatistics Count() { return RendererFactory::GetStatistics(); }
 
-    Released<IGraphicsObject> graphics;
-    Released<IShaderProgram> program;
+    RendererPtr<IGraphicsObject> graphics;
+    RendererPtr<IShaderProgram> program;
     std::unique_ptr<IParameterBinding> width;
     std::unique_ptr<ITextureObject> texture;
-    Released<IRenderTarget> target;
+    RendererPtr<IRenderTarget> target;
 };
 
 } // namespace Moka::Testing

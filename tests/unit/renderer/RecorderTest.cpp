@@ -42,7 +42,7 @@ TEST_F(RecorderTest, VerticesAreHandedOverOnceAndDrawnAgainAfterAFlush) {
 
 // Vertices that nobody drew are replaced in the list only while they are its end.
 TEST_F(RecorderTest, VerticesOfTwoObjectsStayEachItsOwnWhicheverGetsNewOnes) {
-    Released<IGraphicsObject> const other = MakeGraphics();
+    RendererPtr<IGraphicsObject> const other = MakeGraphics();
     float const vertices[] = {5, 6, 7};
     SetVertices({0, 1, 2});
     other->SetVertices(0, vertices, 3);
@@ -59,7 +59,7 @@ TEST_F(RecorderTest, AProgramBuiltAgainInANewContextKeepsItsValuesAndHandles) {
     SetWidth(2.5f);
     RendererFactory::DetachContext();
     SetWidth(3);
-    Released<IShaderProgram> const homeless = MakeProgram();
+    RendererPtr<IShaderProgram> const homeless = MakeProgram();
     std::unique_ptr<IParameterBinding> const early(homeless->GetParameter("width"));
     EXPECT_EQ(early->GetType(), BindingTypeUnknown);
     RendererFactory::AttachContext();

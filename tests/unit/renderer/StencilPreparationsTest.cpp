@@ -95,12 +95,12 @@ protected:
     }
 
     std::unique_ptr<ITextureObject> otherTexture = MakeTexture();
-    Released<IRenderTarget> otherTarget{RendererFactory::CreateOffscreenRenderTarget(otherTexture.get())};
-    Released<IDepthStencilBuffer> buffer{RendererFactory::CreateDepthStencilBuffer(kSize, kSize)};
+    RendererPtr<IRenderTarget> otherTarget{RendererFactory::CreateOffscreenRenderTarget(otherTexture.get())};
+    RendererPtr<IDepthStencilBuffer> buffer{RendererFactory::CreateDepthStencilBuffer(kSize, kSize)};
     IRenderTarget* active = nullptr;
-    Released<IShaderProgram> callers = MakeProgram();
-    Released<IBlendStateObject> blend{RendererFactory::CreateBlendStateObject(BlendStateDescriptor(true))};
-    Released<IDepthStencilState> state{RendererFactory::CreateDepthStencilState({false, false})};
+    RendererPtr<IShaderProgram> callers = MakeProgram();
+    RendererPtr<IBlendStateObject> blend{RendererFactory::CreateBlendStateObject(BlendStateDescriptor(true))};
+    RendererPtr<IDepthStencilState> state{RendererFactory::CreateDepthStencilState({false, false})};
 };
 
 TEST_F(StencilPreparationsTest, OneIsDrawnAgainOnlyWhenTheBufferMayHoldSomethingElse) {
