@@ -172,7 +172,8 @@ private:
     std::shared_ptr<TextureStorage> mTargetCopy;
 
     // What a request must look at before it begins. One number, because each request tests it: 0 while the
-    // context is attached, in deferred mode, with nothing to delete.
+    // context is attached, in deferred mode, with nothing to delete. GL cannot have changed then since the
+    // last request, so there is nothing to prepare.
     static constexpr unsigned kDetached = 1;
     static constexpr unsigned kFlushesAtOnce = 2; // immediate mode, or mIsExternal
     static constexpr unsigned kHasDropped = 4;

@@ -36,11 +36,7 @@ ScissorState const& RequestedState::GetScissor() {
     return mDraw.scissor;
 }
 
-void RequestedState::SetProgram(std::shared_ptr<ProgramState> const& program) {
-    if (MOKA_LIKELY(mProgram == program)) return;
-    mProgram = program;
-    mChanged = true;
-}
+void RequestedState::SetProgram(std::shared_ptr<ProgramState> const& program) { Change(mProgram, program); }
 
 void RequestedState::SetTexture(int unit, std::shared_ptr<TextureStorage> const& storage,
                                 Sampling const& sampling) {
